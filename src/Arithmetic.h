@@ -1,0 +1,69 @@
+// Arithmetic: every wrap, shift, clip and mask of the hardware's numbers, each stated once.
+//
+// The numbered rules are those of docs/arithmetic.md. All functions are defined for every argument:
+// what the hardware loses in a register is computed in unsigned arithmetic here.
+#ifndef MORVIK_ARITHMETIC_H
+#define MORVIK_ARITHMETIC_H
+
+#include <cstdint>
+
+namespace arithmetic {
+
+/// A soft value or metric: a signed 16-bit word, left-aligned in its format (rule 1).
+using Value = std::int16_t;
+
+/// The low 16 bits of a word, read as a two's complement number (rule 2).
+constexpr Value wrap16(std::int32_t value)
+{
+    return static_cast<Value>(static_cast<std::uint16_t>(static_cast<std::uint32_t>(value) & 0xFFFFU));
+}
+
+/// value * 2^count modulo 2^32; like a barrel shifter of five bits, it looks at count modulo 32.
+constexpr std::int32_t shiftLeftWrap(std::int32_t value, std::uint32_t count)
+{
+    return static_cast<std::int32_t>(static_cast<std::uint32_t>(value) << (count & 31U));
+}
+
+/// value / 2^count rounded down (the sign is shifted in), count modulo 32.
+constexpr std::int32_t shiftRight(std::int32_t value, std::uint32_t count)
+{
+    return value >> (count & 31U);
+}
+
+/// value held between lo and hi. Requires lo <= hi.
+template <class Number>
+constexpr Number clip(Number value, Number lo, Number hi)
+{
+    return value < lo ? lo : (hi < value ? hi : value);
+}
+
+/// a + b modulo 2^16: metrics are never normalised and never saturated (rule 2).
+constexpr Value addWrap(Value a, Value b)
+{
+    return wrap16(std::int32_t{a} + b);
+}
+
+/// a - b modulo 2^16 (rule 2).
+constexpr Value subWrap(Value a, Value b)
+{
+    return wrap16(std::int32_t{a} - b);
+}
+
+/// The greater of two metrics, told by the sign of their wrapped difference; a tie gives c1 (rule 3).
+constexpr Value maxWrap(Value c1, Value c2)
+{
+    return subWrap(c1, c2) < 0 ? c2 : c1;
+}
+
+/// The bits of value that mask selects.
+constexpr Value maskBits(Value value, Value mask)
+{
+    return static_cast<Value>(value & mask);
+}
+
+/// Metrics kept at the borders of segments and windows lose their seven low bits (rule 11).
+constexpr Value borderMask = wrap16(0xFF80);
+
+}  // namespace arithmetic
+
+#endif

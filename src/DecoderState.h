@@ -1,0 +1,28 @@
+// DecoderState: the record behind the opaque pointer of the C interface.
+#ifndef MORVIK_DECODERSTATE_H
+#define MORVIK_DECODERSTATE_H
+
+#include <cstdint>
+
+#include "TCalculationEngine.h"
+#include "TDecoder.h"
+#include "TInterleaver.h"
+#include "TNumberFormat.h"
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+/// A decoder state owns its six components; they refer to each other by plain links. The record is
+/// taken from malloc and given to free.
+struct veltra_ip_morvik_v1_0_state {
+    veltra_ip_morvik_v1_0_generics generics;
+    TDecoder* decoder;
+    TInterleaver* interleaver;
+    TCalculationEngine* engine;
+    TNumberFormat* state_format;
+    TNumberFormat* input_format;
+    TNumberFormat* branch_format;
+    bool saturation_reported;      ///< whether the one saturation warning has been given
+    bool tag_truncation_reported;  ///< whether the one tag truncation warning has been given
+    std::uint32_t tag_mask;        ///< the tag bits that are kept
+};
+
+#endif

@@ -1,0 +1,64 @@
+// TCalculationEngine: the family of trellis calculation engines and its factory.
+#ifndef MORVIK_TCALCULATIONENGINE_H
+#define MORVIK_TCALCULATIONENGINE_H
+
+#include <string>
+#include <vector>
+
+#include "T8.h"
+#include "TNumberFormat.h"
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+/// An engine computes the four steps of a soft-in/soft-out pass over a stretch of the trellis.
+///
+/// Order of use: create, set the three formats, `initialise`, then kernels in any order. The
+/// formats are not owned and must outlive the engine. All values are left-aligned 16-bit words of
+/// the state format; a kernel returns a pointer past the stretch it worked on, or null when it
+/// cannot run.
+class MORVIK_API TCalculationEngine {
+public:
+    bool itsUseSSE2 = false;  ///< asks for SSE2 kernels; this engine has none, so its kernels return null
+    const TNumberFormat* itsInputFormat = nullptr;   ///< channel soft values
+    const TNumberFormat* itsStateFormat = nullptr;   ///< state metrics
+    const TNumberFormat* itsBranchFormat = nullptr;  ///< branch metrics
+
+    virtual ~TCalculationEngine();
+
+    /// The type name and properties in property-string form.
+    virtual std::string getProperties() const = 0;
+
+    /// Makes the engine ready once its formats are set; false means that it cannot be used. The
+    /// base warns on the standard output stream when the state format leaves no spare bit, and
+    /// returns true.
+    virtual bool initialise();
+
+    /// Branch metrics: g[k], elements 0 to 3, from intrinsic[k], parity0[k] and parity1[k], for
+    /// k = 0 to n - 1. Returns g + n.
+    virtual T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) = 0;
+
+    /// Forward state metrics: a[j + 1] from a[j] and g[j], a[0] given, up to a[n - 1]. Returns a + n.
+    virtual T8* alpha(unsigned n, const T8* g, T8* a) = 0;
+
+    /// Backward state metrics: b[-j - 1] from b[-j] and g[-j], b[0] given, down to b[-(n - 1)].
+    /// Returns b - n.
+    virtual T8* beta(unsigned n, const T8* g, T8* b) = 0;
+
+    /// Log-likelihood ratios: out[k] from a[k], b[k] and g[k], for k = 0 to n - 1; positive favours
+    /// bit 1. Returns out + n.
+    virtual short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) = 0;
+
+    /// Makes an engine from a property string: "MOD", or "MOD#" with an optional ":" and number of
+    /// table points. Null after one line on the standard error stream when the text is another.
+    /// The caller deletes the engine.
+    static TCalculationEngine* create(const std::string& s);
+
+    /// The type names that are announced: "MOD" alone.
+    static std::vector<std::string> getNames();
+
+protected:
+    TCalculationEngine() = default;
+    TCalculationEngine(const TCalculationEngine&) = default;
+    TCalculationEngine& operator=(const TCalculationEngine&) = default;
+};
+
+#endif

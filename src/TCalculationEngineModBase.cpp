@@ -1,0 +1,310 @@
+// TCalculationEngineModBase: the trellis kernels in their three variants, and the correction table.
+#include "TCalculationEngineModBase.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <cstddef>
+#include <istream>
+#include <ostream>
+
+#include "Arithmetic.h"
+#include "Messages.h"
+#include "Trellis.h"
+#include "TrellisDecision.h"
+
+namespace {
+
+using arithmetic::Value;
+using arithmetic::wrap16;
+using BranchMetrics = trellis::BranchMetrics<Value>;
+using StateMetrics = std::array<Value, trellis::stateCount>;
+
+/// The corrections of an engine's table, called with a decision difference.
+struct Corrections {
+    const unsigned char* anchor;
+
+    constexpr Value operator()(Value difference) const
+    {
+        return anchor[difference];
+    }
+};
+
+using Max = trellis::DecideMax<Value>;
+using MaxStar = trellis::DecideMaxStar<Value, Corrections>;
+using MaxHash = trellis::DecideMaxHash<Value, Corrections>;
+
+BranchMetrics branchMetrics(const T8& g)
+{
+    return {g[0], g[1], g[2], g[3]};
+}
+
+StateMetrics stateMetrics(const T8& column)
+{
+    return {column[0], column[1], column[2], column[3], column[4], column[5], column[6], column[7]};
+}
+
+template <class Decision>
+trellis::Column<Decision> load(const Decision& rule, const T8& column)
+{
+    trellis::Column<Decision> metrics{};
+    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+        metrics[state] = rule.metric(column[state]);
+    }
+    return metrics;
+}
+
+template <class Decision>
+void store(const Decision& rule, const trellis::Column<Decision>& metrics, T8& column)
+{
+    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+        column[state] = rule.stored(metrics[state]);
+    }
+}
+
+template <class Decision>
+T8* forward(const Decision& rule, unsigned n, const T8* g, T8* a)
+{
+    auto metrics = load(rule, *a);
+    for (unsigned j = 1; j < n; ++j) {
+        metrics = trellis::forwardStep(rule, metrics, branchMetrics(g[j - 1]));
+        store(rule, metrics, a[j]);
+    }
+    return a + n;
+}
+
+template <class Decision>
+T8* backward(const Decision& rule, unsigned n, const T8* g, T8* b)
+{
+    auto metrics = load(rule, *b);
+    for (unsigned j = 1; j < n; ++j) {
+        metrics = trellis::backwardStep(rule, metrics, branchMetrics(*g--));
+        store(rule, metrics, *--b);
+    }
+    return b - 1;
+}
+
+template <class Decision>
+short* ratios(const Decision& rule, unsigned n, const T8* a, const T8* b, const T8* g, short* out)
+{
+    for (unsigned k = 0; k < n; ++k) {
+        out[k] = trellis::logLikelihoodRatio(rule, stateMetrics(a[k]), stateMetrics(b[k]), branchMetrics(g[k]));
+    }
+    return out + n;
+}
+
+/// One entry for each signed 16-bit decision difference.
+constexpr std::uint32_t lutSize = 65536;
+
+/// The correction scale * ln(1 + e^-|d|) of one decision difference, rounded half away from zero,
+/// aligned and cut to eight bits; 0 from `range` on. The `ignored` low bits of the magnitude do not
+/// count. The hardware forms the magnitude of a negative difference by inversion, so -1 reads like
+/// 0 (rule 9).
+unsigned char lutEntry(std::int32_t difference, std::uint32_t ignored, long double range, const TNumberFormat& format)
+{
+    const std::int32_t magnitude = difference >= 0 ? difference : ~difference;
+    const std::int32_t kept = magnitude & ~(arithmetic::shiftLeftWrap(1, ignored) - 1);
+    const long double r = static_cast<long double>(arithmetic::shiftRight(kept, format.itsShift)) / format.itsScale;
+    std::int32_t correction = 0;
+    if (r < range) {
+        correction = static_cast<std::int32_t>(std::trunc(format.itsScale * std::log(1.0L + std::exp(-r)) + 0.5L));
+    }
+    return static_cast<unsigned char>(format.place(correction) & 0xFF);
+}
+
+std::nullptr_t refuseType(const char* kernel)
+{
+    messages::writeError("ERROR:TCalculationEngineModBase::", kernel, ":Illegal algorithm type");
+    return nullptr;
+}
+
+}  // namespace
+
+T8* TCalculationEngineModBase::gamma(
+    unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g)
+{
+    return itsUseSSE2 ? nullptr : mod_gamma(n, intrinsic, parity0, parity1, g);
+}
+
+T8* TCalculationEngineModBase::alpha(unsigned n, const T8* g, T8* a)
+{
+    if (itsUseSSE2) {
+        return nullptr;
+    }
+    switch (itsAlphaAlgorithmType) {
+    case MOD:
+        return mod_alpha(n, g, a);
+    case MOD_STAR:
+        return modstar_alpha(n, g, a);
+    case MOD_HASH:
+        return modhash_alpha(n, g, a);
+    case UNKNOWN:
+        break;
+    }
+    return refuseType("alpha");
+}
+
+T8* TCalculationEngineModBase::beta(unsigned n, const T8* g, T8* b)
+{
+    if (itsUseSSE2) {
+        return nullptr;
+    }
+    switch (itsBetaAlgorithmType) {
+    case MOD:
+        return mod_beta(n, g, b);
+    case MOD_STAR:
+        return modstar_beta(n, g, b);
+    case MOD_HASH:
+        return modhash_beta(n, g, b);
+    case UNKNOWN:
+        break;
+    }
+    return refuseType("beta");
+}
+
+short* TCalculationEngineModBase::llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out)
+{
+    if (itsUseSSE2) {
+        return nullptr;
+    }
+    switch (itsLLRAlgorithmType) {
+    case MOD:
+        return mod_llr(n, a, b, g, out);
+    case MOD_STAR:
+        return modstar_llr(n, a, b, g, out);
+    case MOD_HASH:
+        return modhash_llr(n, a, b, g, out);
+    case UNKNOWN:
+        break;
+    }
+    return refuseType("llr");
+}
+
+T8* TCalculationEngineModBase::mod_gamma(
+    unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) const
+{
+    // The limits are the branch format's integers, aligned like state metrics: -2048 and 2032 (rule 5).
+    const std::int32_t lo = wrap16(arithmetic::shiftLeftWrap(itsBranchFormat->itsMinQ, itsStateFormat->itsShift));
+    const std::int32_t hi = wrap16(arithmetic::shiftLeftWrap(itsBranchFormat->itsMaxQ, itsStateFormat->itsShift));
+    for (unsigned k = 0; k < n; ++k) {
+        const auto sums = trellis::branchSums<std::int32_t>(intrinsic[k], parity0[k], parity1[k]);
+        for (unsigned i = 0; i < sums.size(); ++i) {
+            g[k][i] = wrap16(arithmetic::clip(sums[i], lo, hi));
+        }
+    }
+    return g + n;
+}
+
+T8* TCalculationEngineModBase::mod_alpha(unsigned n, const T8* g, T8* a) const
+{
+    return forward(Max{}, n, g, a);
+}
+
+T8* TCalculationEngineModBase::mod_beta(unsigned n, const T8* g, T8* b) const
+{
+    return backward(Max{}, n, g, b);
+}
+
+short* TCalculationEngineModBase::mod_llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) const
+{
+    return ratios(Max{}, n, a, b, g, out);
+}
+
+T8* TCalculationEngineModBase::modstar_alpha(unsigned n, const T8* g, T8* a) const
+{
+    return forward(MaxStar(Corrections{itsAlphaLUT}), n, g, a);
+}
+
+T8* TCalculationEngineModBase::modstar_beta(unsigned n, const T8* g, T8* b) const
+{
+    return backward(MaxStar(Corrections{itsBetaLUT}), n, g, b);
+}
+
+short* TCalculationEngineModBase::modstar_llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) const
+{
+    return ratios(MaxStar(Corrections{itsLLRLUT}), n, a, b, g, out);
+}
+
+T8* TCalculationEngineModBase::modhash_alpha(unsigned n, const T8* g, T8* a) const
+{
+    return forward(MaxHash(Corrections{itsAlphaLUT}), n, g, a);
+}
+
+T8* TCalculationEngineModBase::modhash_beta(unsigned n, const T8* g, T8* b) const
+{
+    return backward(MaxHash(Corrections{itsBetaLUT}), n, g, b);
+}
+
+short* TCalculationEngineModBase::modhash_llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) const
+{
+    return ratios(MaxHash(Corrections{itsLLRLUT}), n, a, b, g, out);
+}
+
+bool TCalculationEngineModBase::hasSSE2()
+{
+    return false;
+}
+
+std::vector<unsigned char> TCalculationEngineModBase::createLUT(unsigned points, const TNumberFormat& stateFormat)
+{
+    const std::uint32_t fractionAndShift = stateFormat.itsBinPt + stateFormat.itsShift;
+    if (fractionAndShift >= 9) {
+        messages::writeError(
+            "ERROR:TCalculationEngineModBase::createLUT:Binary point of state metrics is incompatible with "
+            "8 bit lookup tables");
+        return {};
+    }
+    const std::uint64_t range = points == 0 ? lutSize : points;
+    std::uint32_t log2Range = 0;
+    while ((std::uint64_t{1} << log2Range) < range) {
+        ++log2Range;
+    }
+    if ((std::uint64_t{1} << log2Range) != range) {
+        messages::writeError("ERROR:TCalculationEngineModBase::createLUT:Number of points must be a binary number");
+        return {};
+    }
+    // The table resolves eight points to one at most, and no more fraction bits than the format has.
+    const std::uint32_t resolved = log2Range > 2 ? std::min(stateFormat.itsBinPt, log2Range - 3) : 0;
+    const std::uint32_t ignored = fractionAndShift - resolved;
+    std::vector<unsigned char> lut;
+    lut.reserve(lutSize);
+    for (std::int32_t difference = -32768; difference <= 32767; ++difference) {
+        lut.push_back(lutEntry(difference, ignored, static_cast<long double>(range), stateFormat));
+    }
+    return lut;
+}
+
+std::ostream& operator<<(std::ostream& os, TCalculationEngineModBase::AlgorithmType type)
+{
+    switch (type) {
+    case TCalculationEngineModBase::MOD:
+        return os << "MOD";
+    case TCalculationEngineModBase::MOD_STAR:
+        return os << "MOD*";
+    case TCalculationEngineModBase::MOD_HASH:
+        return os << "MOD#";
+    case TCalculationEngineModBase::UNKNOWN:
+        break;
+    }
+    return os << "<unknown>";
+}
+
+std::istream& operator>>(std::istream& is, TCalculationEngineModBase::AlgorithmType& type)
+{
+    type = TCalculationEngineModBase::UNKNOWN;
+    for (const char letter : {'M', 'O', 'D'}) {
+        const int next = is.peek();
+        if (!is || (next != letter && next != letter - 'A' + 'a')) {
+            return is;
+        }
+        is.get();
+    }
+    const int next = is.peek();
+    if (next == '*' || next == '#') {
+        is.get();
+        type = next == '*' ? TCalculationEngineModBase::MOD_STAR : TCalculationEngineModBase::MOD_HASH;
+    } else if (next <= ' ' || next == ':') {  // the end of the input counts as -1
+        type = TCalculationEngineModBase::MOD;
+    }
+    return is;
+}

@@ -1,0 +1,67 @@
+// TCalculationEngineModBase: the trellis kernels in their three variants, and the correction table.
+#ifndef MORVIK_TCALCULATIONENGINEMODBASE_H
+#define MORVIK_TCALCULATIONENGINEMODBASE_H
+
+#include <cstdint>
+#include <iosfwd>
+#include <vector>
+
+#include "TCalculationEngine.h"
+
+/// The max-log-MAP kernels. Each of alpha, beta and llr has an algorithm type of its own and an
+/// anchor into a correction table: anchor[d] is the correction of the decision difference d, for
+/// d from -32768 to 32767, so the anchor points at the table's middle entry.
+class MORVIK_API TCalculationEngineModBase : public TCalculationEngine {
+public:
+    /// How a decision between two candidate metrics is made; printed as the text behind it.
+    enum AlgorithmType : std::int32_t {
+        UNKNOWN = 0,   ///< "<unknown>": no valid type
+        MOD = 1,       ///< "MOD": the greater candidate
+        MOD_STAR = 2,  ///< "MOD*": plus the correction of this decision
+        MOD_HASH = 3,  ///< "MOD#": plus the correction of the winner's last decision
+    };
+
+    AlgorithmType itsAlphaAlgorithmType = MOD;
+    AlgorithmType itsBetaAlgorithmType = MOD;
+    AlgorithmType itsLLRAlgorithmType = MOD;
+    const unsigned char* itsAlphaLUT = nullptr;  ///< anchor, not owned; read by "MOD*" and "MOD#"
+    const unsigned char* itsBetaLUT = nullptr;   ///< anchor, not owned
+    const unsigned char* itsLLRLUT = nullptr;    ///< anchor, not owned
+
+    /// The kernels, dispatched on the algorithm types. An illegal type gives null after one line on
+    /// the standard error stream.
+    T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) override;
+    T8* alpha(unsigned n, const T8* g, T8* a) override;
+    T8* beta(unsigned n, const T8* g, T8* b) override;
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override;
+
+    /// The kernels of each variant, whatever the engine's algorithm types say.
+    T8* mod_gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) const;
+    T8* mod_alpha(unsigned n, const T8* g, T8* a) const;
+    T8* mod_beta(unsigned n, const T8* g, T8* b) const;
+    short* mod_llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) const;
+    T8* modstar_alpha(unsigned n, const T8* g, T8* a) const;
+    T8* modstar_beta(unsigned n, const T8* g, T8* b) const;
+    short* modstar_llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) const;
+    T8* modhash_alpha(unsigned n, const T8* g, T8* a) const;
+    T8* modhash_beta(unsigned n, const T8* g, T8* b) const;
+    short* modhash_llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) const;
+
+    /// Whether SSE2 kernels exist behind itsUseSSE2: they do not.
+    static bool hasSSE2();
+
+    /// The correction table ln(1 + e^-|d|) for `points` points, 0 meaning 65536: 65536 entries,
+    /// entry d + 32768 for difference d, aligned like the state format (rule 9). Empty after one
+    /// line on the standard error stream when `points` is no power of two or an aligned correction
+    /// would not fit into eight bits.
+    static std::vector<unsigned char> createLUT(unsigned points, const TNumberFormat& stateFormat);
+};
+
+/// Writes the text of an algorithm type.
+MORVIK_API std::ostream& operator<<(std::ostream& os, TCalculationEngineModBase::AlgorithmType type);
+
+/// Reads "MOD", "MOD*" or "MOD#" in any case; a plain "MOD" must be followed by a blank, ":" or the
+/// end. Anything else leaves the type UNKNOWN and the offending character unread.
+MORVIK_API std::istream& operator>>(std::istream& is, TCalculationEngineModBase::AlgorithmType& type);
+
+#endif

@@ -1,0 +1,98 @@
+// TDecoder3G: the turbo decoder over the whole trellis with one engine.
+#ifndef MORVIK_TDECODER3G_H
+#define MORVIK_TDECODER3G_H
+
+#include <array>
+#include <string>
+#include <vector>
+
+#include "TDecoder.h"
+
+/// Separates the input streams, runs the half-iterations of the two constituent decoders in turn
+/// and makes the hard decisions. Constituent decoder 0 works in natural order, 1 in interleaved
+/// order. Even half-iterations belong to decoder 1, odd ones to decoder 0, so that every decode
+/// ends in natural order.
+///
+/// Input layouts: LTE, 3 K + 12 values, one parity stream for each decoder; and 3GPP2, 5 K + 18
+/// values, two parity streams for each. Values are aligned words of the state format.
+class MORVIK_API TDecoder3G : public TDecoder {
+public:
+    std::array<std::vector<short>, 2> itsSys;   ///< systematic values of each constituent decoder, K + 3
+    std::array<std::vector<short>, 2> itsPar0;  ///< first parity values, K + 3
+    std::array<std::vector<short>, 2> itsPar1;  ///< second parity values, K + 3; zeros in the LTE layout
+    const bool is3GPP2;                         ///< the input layout
+
+    /// Makes the decoder; the properties must be empty, else null after one line on the standard
+    /// error stream. The caller deletes it.
+    static TDecoder* create(bool layout3GPP2, const std::string& properties);
+
+    bool allocate(unsigned int blockSize) override;
+
+    /// "3GPP2" or "3GPP".
+    std::string getProperties() const override;
+
+    /// Counts the errors after each iteration: entry t of bitErrors and blockErrors counts those
+    /// that are left after iteration t.
+    bool decode(const std::vector<short>& soft,
+                const std::vector<unsigned char>& reference,
+                std::vector<unsigned long long>& bitErrors,
+                std::vector<unsigned long long>& blockErrors) override;
+
+    bool decode(const std::vector<short>& soft, std::vector<unsigned char>& hard, unsigned int iterations) override;
+
+    void dump(std::ostream& out) override;
+
+    /// Writes a table with one row for each trellis step: intrinsic value, forward, backward and
+    /// branch metrics, log-likelihood ratio and extrinsic value, as real numbers.
+    void dumpFull(std::ostream& out, unsigned int halfIteration) override;
+
+    /// The steps of a decode, in order of use; h is the half-iteration. Each returns false when the
+    /// decode is to end.
+    virtual bool extract(const std::vector<short>& soft);
+    virtual bool calcIntrinsic(unsigned int h);
+    virtual bool calcGamma(unsigned int h);
+    virtual bool calcAlpha(unsigned int h);
+    virtual bool calcBeta(unsigned int h);
+    virtual bool calcLLR(unsigned int h);
+    virtual bool calcExtrinsic(unsigned int h);
+    virtual bool calcSISO(unsigned int h);
+
+protected:
+    explicit TDecoder3G(bool layout3GPP2);
+
+    /// The constituent decoder that half-iteration h belongs to.
+    static unsigned constituent(unsigned int h)
+    {
+        return h % 2 == 0 ? 1 : 0;
+    }
+
+    /// One kernel over the trellis steps j to k; backward from j down to k. The start column of a
+    /// recursion, at step j, must be in place.
+    bool calcGamma(unsigned int h, unsigned int j, unsigned int k);
+    bool calcAlpha(unsigned int h, unsigned int j, unsigned int k);
+    bool calcBeta(unsigned int h, unsigned int j, unsigned int k);
+    bool calcLLR(unsigned int h, unsigned int j, unsigned int k);
+
+    /// The column of an encoder known to be in state 0: 0 for state 0, half the most negative
+    /// metric for the others (rule 10).
+    void setInitialState(T8* column) const;
+
+    /// The column that favours no state: zeros (rule 10).
+    static void setUnknownState(T8* column);
+
+private:
+    using SoftValues = std::vector<short>::const_iterator;
+
+    /// Takes the parity values of one trellis step of constituent decoder d from the input.
+    void appendParity(unsigned d, SoftValues& next);
+    bool interleaveSystematic(unsigned K);
+    /// Brings the table by which constituent decoder d reads extrinsic values to K entries.
+    bool preparePermutation(unsigned d, unsigned K) const;
+    std::vector<unsigned>& permutation(unsigned d) const;
+    /// The extrinsic values with which a decode starts: the preset ones, or zeros.
+    bool startExtrinsic();
+    std::vector<unsigned char> hardDecisions() const;
+    void dumpInput() const;
+};
+
+#endif

@@ -1,0 +1,341 @@
+// TDecoder3GPU: the turbo decoder split over parallel processing units.
+#include "TDecoder3GPU.h"
+
+#include <locale>
+#include <ostream>
+#include <sstream>
+#include <utility>
+
+#include "Arithmetic.h"
+#include "Messages.h"
+
+namespace {
+
+constexpr std::uint32_t defaultUnits = 4;
+constexpr std::uint32_t defaultThreads = 4;
+constexpr std::uint32_t traceSegments = 1;  ///< above this level, the segmentation is traced
+constexpr std::uint32_t traceColumns = 8;   ///< above this level, every border column is traced
+
+/// A column as it is kept at a border between segments or windows (rule 11).
+T8 border(const T8& column)
+{
+    T8 kept{};
+    for (unsigned state = 0; state < 8; ++state) {
+        kept[state] = arithmetic::maskBits(column[state], arithmetic::borderMask);
+    }
+    return kept;
+}
+
+/// The number of segments doubles until every thread has one or they become shorter than 64 steps.
+std::uint32_t segmentCount(std::uint32_t K, std::uint64_t threads)
+{
+    std::uint64_t count = 1;
+    if (threads >= 2 && K >= 128) {
+        do {
+            count *= 2;
+        } while (count < threads && 128 * count <= K);
+    }
+    return static_cast<std::uint32_t>(count);
+}
+
+/// The steps of the next window when `rest` steps of the segment remain: 64, and the last 65 to 127
+/// in two halves, the longer first.
+std::uint32_t windowLength(std::uint32_t rest)
+{
+    if (rest >= 128) {
+        return 64;
+    }
+    return rest > 64 ? (rest + 1) / 2 : rest;
+}
+
+/// Reads one of the decoder's numbers; false, after an error line, when it is missing or 0.
+bool readNumber(std::istream& text, const char* what, std::uint32_t& number)
+{
+    text >> number;
+    if (text.fail() || number == 0) {
+        messages::writeError("ERROR:TDecoder3GPU:Illegal number of ", what, ":", number);
+        return false;
+    }
+    return true;
+}
+
+/// "[m0 m1 ... m7]"
+std::string text(const T8& column)
+{
+    std::string metrics;
+    for (const short metric : column.metric) {
+        metrics += (metrics.empty() ? "[" : " ") + std::to_string(metric);
+    }
+    return metrics + "]";
+}
+
+std::string text(const std::vector<TDecoder3GPU::ABSegment>& segments)
+{
+    std::ostringstream list;
+    list.imbue(std::locale::classic());
+    const char* separator = "";
+    for (const TDecoder3GPU::ABSegment& segment : segments) {
+        list << separator << segment;
+        separator = " ";
+    }
+    return list.str();
+}
+
+void traceStarts(const char* label, const std::vector<T8>& starts)
+{
+    for (std::size_t i = 0; i < starts.size(); ++i) {
+        messages::writeLine(messages::output(), label, i, "]=", text(starts[i]));
+    }
+}
+
+}  // namespace
+
+TDecoder3GPU::TDecoder3GPU(bool layout3GPP2, std::uint32_t numPU, std::uint32_t threadsPerPU)
+    : TDecoder3G(layout3GPP2), itsNumPU(numPU), itsThreadsPerPU(threadsPerPU)
+{
+}
+
+TDecoder* TDecoder3GPU::create(bool layout3GPP2, const std::string& properties)
+{
+    std::uint32_t units = defaultUnits;
+    std::uint32_t threads = defaultThreads;
+    if (!properties.empty()) {
+        std::istringstream numbers(properties);
+        numbers.imbue(std::locale::classic());
+        if (!readNumber(numbers, "processing units", units)) {
+            return nullptr;
+        }
+        if (numbers.peek() == ',') {
+            numbers.get();
+            if (!readNumber(numbers, "threads per processing unit", threads)) {
+                return nullptr;
+            }
+        }
+    }
+    return new TDecoder3GPU(layout3GPP2, units, threads);
+}
+
+std::string TDecoder3GPU::getProperties() const
+{
+    const std::string units = (is3GPP2 ? "3GPP2PU:" : "3GPPPU:") + std::to_string(itsNumPU);
+    return itsThreadsPerPU == defaultThreads ? units : units + "," + std::to_string(itsThreadsPerPU);
+}
+
+bool TDecoder3GPU::allocate(unsigned int blockSize)
+{
+    if (!TDecoder3G::allocate(blockSize)) {
+        return false;
+    }
+    // The last segment's end tells for which K the segments were cut; none are left by a refused size.
+    const std::uint32_t K = blockSize - tailSteps;
+    if ((itsAlphaSegment.empty() || itsAlphaSegment.back().to != K) && !buildSegments(K)) {
+        return false;
+    }
+    for (const unsigned d : {0U, 1U}) {
+        itsAlphaInit[d].assign(itsAlphaSegment.size(), T8{});
+        itsBetaInit[d].assign(itsBetaSegment.size(), T8{});
+    }
+    return true;
+}
+
+bool TDecoder3GPU::buildSegments(std::uint32_t K)
+{
+    itsAlphaSegment.clear();
+    itsBetaSegment.clear();
+    itsNT = segmentCount(K, std::uint64_t{itsNumPU} * itsThreadsPerPU);
+    if (itsTraceLevel > 0) {
+        messages::writeLine(messages::output(), "itsNT=", itsNT);
+    }
+    const std::uint32_t length = K / itsNT;
+    if (K != itsNT * length) {
+        messages::writeError("ERROR:TDecoder3GPU:Block size not supported");
+        return false;
+    }
+    std::vector<ABSegment> segments;
+    for (std::uint32_t u = 0; u < itsNT; ++u) {
+        segments.push_back({u * length, (u + 1) * length});
+    }
+    std::vector<ABSegment> windows;
+    for (std::uint32_t offset = 0; offset < length;) {
+        const std::uint32_t next = offset + windowLength(length - offset);
+        for (std::uint32_t u = 0; u < itsNT; ++u) {
+            const std::uint32_t first = u * length + offset;
+            windows.push_back({u * length + next - 1, first == 0 ? 0 : first - 1});
+        }
+        offset = next;
+    }
+    itsAlphaSegment = std::move(segments);
+    itsBetaSegment = std::move(windows);
+    if (itsTraceLevel > traceSegments) {
+        messages::writeLine(messages::output(), "itsAlphaSegment=", text(itsAlphaSegment));
+        messages::writeLine(messages::output(), "itsBetaSegment =", text(itsBetaSegment));
+    }
+    return true;
+}
+
+bool TDecoder3GPU::calcGamma(unsigned int h)
+{
+    // The tail steps are left out. For a block of no bits the range is empty: 0 to -1, modulo 2^32.
+    return calcGamma(h, 0, itsBlockSize - tailSteps - 1);
+}
+
+bool TDecoder3GPU::calcAlpha(unsigned int h)
+{
+    std::vector<T8>& starts = itsAlphaInit[constituent(h)];
+    const bool traced = itsTraceLevel > traceColumns;
+    if (traced) {
+        messages::writeLine(messages::output(), "TDecoder3GPU::calcAlpha(", h, ")");
+    }
+    if (h < 2) {
+        initialiseAlpha(h);
+    }
+    T8 reached = starts[0];
+    for (std::size_t u = 0; u < starts.size(); ++u) {
+        const auto [from, to] = itsAlphaSegment[u];
+        const T8 start = starts[u];
+        itsAlpha[from] = start;
+        starts[u] = border(reached);
+        if (traced) {
+            messages::writeLine(
+                messages::output(), "from=", from, " to=", to, " init=", text(start), " newinit=", text(starts[u]));
+        }
+        if (!calcAlpha(h, from, to)) {
+            return false;
+        }
+        reached = itsAlpha[to];
+    }
+    if (traced) {
+        traceStarts("itsAlphaInit[", starts);
+    }
+    return true;
+}
+
+void TDecoder3GPU::initialiseAlpha(unsigned int h)
+{
+    std::vector<T8>& starts = itsAlphaInit[constituent(h)];
+    setInitialState(starts.data());
+    for (unsigned u = 1; u < starts.size(); ++u) {
+        preCalcAlpha(h, u, &starts[u]);
+    }
+}
+
+bool TDecoder3GPU::calcBeta(unsigned int h)
+{
+    std::vector<T8>& starts = itsBetaInit[constituent(h)];
+    const bool traced = itsTraceLevel > traceColumns;
+    if (traced) {
+        messages::writeLine(messages::output(), "TDecoder3GPU::calcBeta(", h, ")");
+    }
+    if (h < 2) {
+        initialiseBeta(h);
+    }
+    // The units hold one start column for each segment and fetch the next row's while they work on
+    // this one's: before the recursion of a window, not after it.
+    std::vector<T8> row = starts;
+    row.resize(itsNT);
+    for (std::size_t i = 0; i < starts.size(); ++i) {
+        T8& held = row[i % itsNT];
+        const T8 start = h < 2 && i + 1 < starts.size() ? T8{} : held;
+        if (i + itsNT < starts.size()) {
+            held = starts[i + itsNT];
+        }
+        if (!runWindow(h, i, start)) {
+            return false;
+        }
+    }
+    if (traced) {
+        traceStarts("itsBetaInit[", starts);
+    }
+    return true;
+}
+
+void TDecoder3GPU::initialiseBeta(unsigned int h)
+{
+    std::vector<T8>& starts = itsBetaInit[constituent(h)];
+    for (unsigned i = 0; i + 1 < starts.size(); ++i) {
+        preCalcBeta(h, i, &starts[i]);
+    }
+    if (!starts.empty()) {
+        preCalcBetaTail(h, &starts.back());
+    }
+}
+
+bool TDecoder3GPU::runWindow(unsigned int h, std::size_t i, const T8& start)
+{
+    const auto [from, to] = itsBetaSegment[i];
+    const T8 neighbours = itsBeta[to];
+    itsBeta[from] = start;
+    if (!calcBeta(h, from, to)) {
+        return false;
+    }
+    const T8 reached = itsBeta[to];
+    if (itsTraceLevel > traceColumns) {
+        messages::writeLine(
+            messages::output(), "from=", from, " to=", to, " beta[from]=", text(start), " beta[to]=", text(reached));
+    }
+    if (i == 0) {
+        return true;  // the block's first window ends at its own first step: nobody starts from there
+    }
+    const std::size_t entry = windowStartingWhereEnds(i);
+    T8& stored = itsBetaInit[constituent(h)][entry];
+    stored = border(reached);
+    itsBeta[to] = neighbours;
+    if (itsTraceLevel > traceColumns) {
+        messages::writeLine(messages::output(), " init[", entry, "]=", text(stored));
+    }
+    return true;
+}
+
+std::size_t TDecoder3GPU::windowStartingWhereEnds(std::size_t i) const
+{
+    const std::size_t windows = itsBetaSegment.size();
+    return i >= itsNT ? i - itsNT : windows - itsNT + i - 1;
+}
+
+bool TDecoder3GPU::preCalcAlpha(unsigned int, unsigned int, T8* column)
+{
+    setUnknownState(column);
+    return true;
+}
+
+bool TDecoder3GPU::preCalcBeta(unsigned int, unsigned int, T8* column)
+{
+    setUnknownState(column);
+    return true;
+}
+
+bool TDecoder3GPU::preCalcBetaTail(unsigned int h, T8* column) const
+{
+    const unsigned d = constituent(h);
+    const std::size_t K = itsBlockSize - tailSteps;
+    const auto x = [&](unsigned step) {
+        return int{itsSys[d][K + step]};
+    };
+    const auto p = [&](unsigned step) {
+        return int{itsPar0[d][K + step]};
+    };
+    const auto q = [&](unsigned step) {
+        return int{itsPar1[d][K + step]};
+    };
+    const int e2 = x(2) + p(2) + q(2);
+    const int e1 = x(1) + p(1) + q(1);
+    const int f1 = x(1) - p(1) + q(1);
+    const int metrics[8] = {-e2 - e1 - (x(0) + p(0) + q(0)),
+                            -e2 - e1 + (x(0) + p(0) + q(0)),
+                            -e2 + e1 + (x(0) - p(0) + q(0)),
+                            -e2 + e1 - (x(0) - p(0) + q(0)),
+                            e2 + f1 - (x(0) - p(0) - q(0)),
+                            e2 + f1 + (x(0) - p(0) - q(0)),
+                            e2 - f1 + (x(0) + p(0) - q(0)),
+                            e2 - f1 - (x(0) + p(0) - q(0))};
+    for (unsigned state = 0; state < 8; ++state) {
+        (*column)[state] = arithmetic::wrap16(metrics[state]);
+    }
+    *column = border(*column);
+    return true;
+}
+
+std::ostream& operator<<(std::ostream& os, const TDecoder3GPU::ABSegment& segment)
+{
+    return os << '[' << segment.from << ',' << segment.to << ')';
+}

@@ -1,0 +1,41 @@
+// TraceTable: rows of a trace, one for each trellis step.
+#include "TraceTable.h"
+
+#include <iomanip>
+#include <locale>
+
+TraceRow::TraceRow(const TNumberFormat& format) : itsFormat(format)
+{
+    itsText.imbue(std::locale::classic());
+    itsText << std::left << std::fixed << std::setprecision(6);
+}
+
+void TraceRow::begin(unsigned step)
+{
+    itsText.str({});
+    itsText << std::noshowpos << std::setw(5) << step << std::showpos;
+}
+
+void TraceRow::value(short aligned)
+{
+    itsText << std::setw(12) << itsFormat.real(aligned);
+}
+
+void TraceRow::values(const T8& column, unsigned first, unsigned last)
+{
+    for (unsigned i = first; i <= last; ++i) {
+        value(column[i]);
+    }
+}
+
+void TraceRow::gap()
+{
+    itsText << "  ";
+}
+
+void TraceRow::end(std::ostream& out)
+{
+    const std::string row = itsText.str();
+    out.write(row.data(), static_cast<std::streamsize>(row.size()));
+    out.put('\n');
+}

@@ -1,0 +1,35 @@
+// TraceTable: rows of a trace, one for each trellis step.
+#ifndef MORVIK_TRACETABLE_H
+#define MORVIK_TRACETABLE_H
+
+#include <sstream>
+
+#include "T8.h"
+#include "TNumberFormat.h"
+
+/// Composes a row and writes it. Steps take a field of 5 characters, values one of 12, both
+/// left-aligned; a value is a real number with a sign and 6 decimals.
+class TraceRow {
+public:
+    explicit TraceRow(const TNumberFormat& format);
+
+    /// Begins a new row.
+    void begin(unsigned step);
+
+    void value(short aligned);
+
+    /// Elements first to last of a column.
+    void values(const T8& column, unsigned first, unsigned last);
+
+    /// Two blanks between groups of values.
+    void gap();
+
+    /// Writes the row and a newline.
+    void end(std::ostream& out);
+
+private:
+    const TNumberFormat& itsFormat;
+    std::ostringstream itsText;
+};
+
+#endif

@@ -1,0 +1,122 @@
+// TrellisDecision: the three ways to decide between two candidates at a trellis state (rule 7).
+//
+// The first candidate is the one that the branch for bit 1 reaches. A table is anything that can be
+// called with a decision difference and returns its correction, aligned like the metrics.
+#ifndef MORVIK_TRELLISDECISION_H
+#define MORVIK_TRELLISDECISION_H
+
+#include "Arithmetic.h"
+
+namespace trellis {
+
+using arithmetic::addWrap;
+using arithmetic::maxWrap;
+using arithmetic::subWrap;
+
+/// Decisions that leave nothing pending: a metric is a plain value.
+template <class Value>
+struct PlainMetrics {
+    using Metric = Value;
+
+    static constexpr Metric metric(Value value)
+    {
+        return value;
+    }
+
+    static constexpr Metric add(Metric m, Value g)
+    {
+        return addWrap(m, g);
+    }
+
+    static constexpr Metric subtract(Metric m, Value g)
+    {
+        return subWrap(m, g);
+    }
+
+    static constexpr Value stored(Metric m)
+    {
+        return m;
+    }
+
+    static constexpr Value settled(Metric m)
+    {
+        return m;
+    }
+};
+
+/// "MOD": the greater candidate, max-log-MAP.
+template <class Value>
+struct DecideMax : PlainMetrics<Value> {
+    static constexpr Value decide(Value c1, Value c2)
+    {
+        return maxWrap(c1, c2);
+    }
+};
+
+/// "MOD*": the greater candidate plus the correction for how close the two were.
+template <class Value, class Table>
+struct DecideMaxStar : PlainMetrics<Value> {
+    Table table;
+
+    explicit constexpr DecideMaxStar(Table corrections) : table(corrections) {}
+
+    constexpr Value decide(Value c1, Value c2) const
+    {
+        return addWrap(maxWrap(c1, c2), table(subWrap(c1, c2)));
+    }
+};
+
+/// A metric whose last decision's correction is still to be added.
+template <class Value>
+struct PendingMetric {
+    Value value;
+    Value pending;
+};
+
+/// "MOD#": the correction of a decision arrives one stage late. Candidates are compared without
+/// what is pending; the winner takes its pending correction along. This takes the table out of the
+/// hardware's critical loop.
+template <class Value, class Table>
+struct DecideMaxHash {
+    using Metric = PendingMetric<Value>;
+
+    Table table;
+
+    explicit constexpr DecideMaxHash(Table corrections) : table(corrections) {}
+
+    static constexpr Metric metric(Value value)
+    {
+        return {value, Value{}};
+    }
+
+    static constexpr Metric add(Metric m, Value g)
+    {
+        return {addWrap(m.value, g), m.pending};
+    }
+
+    static constexpr Metric subtract(Metric m, Value g)
+    {
+        return {subWrap(m.value, g), m.pending};
+    }
+
+    constexpr Metric decide(Metric c1, Metric c2) const
+    {
+        const Value difference = subWrap(c1.value, c2.value);
+        const Metric winner = difference < 0 ? c2 : c1;
+        return {addWrap(winner.value, winner.pending), table(difference)};
+    }
+
+    static constexpr Value stored(Metric m)
+    {
+        return m.value;
+    }
+
+    static constexpr Value settled(Metric m)
+    {
+        return addWrap(m.value, m.pending);
+    }
+};
+
+}  // namespace trellis
+
+#endif

@@ -1,0 +1,8 @@
+/* The public header alone, as strict C99. */
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+/* Fourteen words: three pointers and eleven integers, with the padding that the pointers ask for. */
+typedef char generics_have_fourteen_words
+    [sizeof(veltra_ip_morvik_v1_0_generics) == 3 * sizeof(char*) + 11 * 4 + (sizeof(char*) - 4) ? 1 : -1];
+
+extern veltra_ip_morvik_v1_0_state* header_state;

@@ -1,0 +1,41 @@
+// CapturedStreams: collects what the library writes while it lives.
+#ifndef MORVIK_TESTS_CAPTUREDSTREAMS_H
+#define MORVIK_TESTS_CAPTUREDSTREAMS_H
+
+#include <iostream>
+#include <sstream>
+#include <string>
+
+/// Takes the place of the standard output and error streams' buffers, and gives them back at the
+/// end of its life.
+class CapturedStreams {
+public:
+    CapturedStreams() : itsCout(std::cout.rdbuf(itsOut.rdbuf())), itsCerr(std::cerr.rdbuf(itsErr.rdbuf())) {}
+
+    ~CapturedStreams()
+    {
+        std::cout.rdbuf(itsCout);
+        std::cerr.rdbuf(itsCerr);
+    }
+
+    CapturedStreams(const CapturedStreams&) = delete;
+    CapturedStreams& operator=(const CapturedStreams&) = delete;
+
+    std::string out() const
+    {
+        return itsOut.str();
+    }
+
+    std::string err() const
+    {
+        return itsErr.str();
+    }
+
+private:
+    std::ostringstream itsOut;
+    std::ostringstream itsErr;
+    std::streambuf* itsCout;
+    std::streambuf* itsCerr;
+};
+
+#endif

@@ -1,0 +1,24 @@
+// Configurations: every number of processing units with every algorithm type, for tests that run on all.
+#ifndef MORVIK_TESTS_CONFIGURATIONS_H
+#define MORVIK_TESTS_CONFIGURATIONS_H
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <tuple>
+
+/// Processing units and algorithm type.
+using Configuration = std::tuple<int, int>;
+
+inline auto everyConfiguration()
+{
+    return testing::Combine(testing::Values(2, 4, 8), testing::Values(0, 1, 2));
+}
+
+inline std::string configurationName(const testing::TestParamInfo<Configuration>& configuration)
+{
+    const auto [units, algorithm] = configuration.param;
+    return "Units" + std::to_string(units) + "Type" + std::to_string(algorithm);
+}
+
+#endif
