@@ -1,0 +1,23 @@
+// Command: what main needs to know of a subcommand.
+#ifndef MORVIK_COMMAND_H
+#define MORVIK_COMMAND_H
+
+#include <CLI/CLI.hpp>
+#include <functional>
+
+namespace morvik {
+
+/// Exit statuses that all subcommands share.
+enum ExitStatus { success = 0, differencesFound = 1, badInputOrUsage = 2 };
+
+/// A subcommand: its arguments, and the work that starts when it was named on the command line.
+///
+/// `run` returns the exit status. Whatever it throws is reported by main in one line, with the status for bad input.
+struct Command {
+    CLI::App* arguments;
+    std::function<int()> run;
+};
+
+}  // namespace morvik
+
+#endif

@@ -1,0 +1,199 @@
+// Decode: the subcommand that turns a file of soft values into decisions.
+#include "Decode.h"
+
+#include <algorithm>
+#include <chrono>
+#include <cstdint>
+#include <iostream>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Arguments.h"
+#include "Decoder.h"
+#include "DecoderOptions.h"
+#include "Files.h"
+#include "ReferenceBits.h"
+#include "SoftValueReader.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::string input = standardStream;
+    std::string output = standardStream;
+    std::string reference;  // empty: none
+    DecoderOptions decoder;
+    std::uint32_t firstTag = 0;
+    std::uint32_t tracedPasses = 0;
+};
+
+/// What the line at the end tells.
+struct Summary {
+    std::uint32_t blocks = 0;
+    std::size_t smallest = 0;
+    std::size_t largest = 0;
+    std::uint64_t bits = 0;
+    std::uint64_t bitErrors = 0;
+    std::uint64_t blockErrors = 0;
+    std::chrono::duration<double> decoding{0};
+
+    void countBlock(std::size_t size)
+    {
+        smallest = blocks == 0 ? size : std::min(smallest, size);
+        largest = std::max(largest, size);
+        bits += size;
+        ++blocks;
+    }
+
+    void countErrors(std::size_t errors)
+    {
+        bitErrors += errors;
+        blockErrors += errors > 0 ? 1 : 0;
+    }
+};
+
+/// "1 block", "2 blocks".
+std::string counted(std::uint64_t count, const std::string& noun)
+{
+    return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
+}
+
+void print(const Summary& summary, bool withErrors)
+{
+    std::cerr << counted(summary.blocks, "block") << " of ";
+    if (summary.smallest < summary.largest) {
+        std::cerr << summary.smallest << " to ";
+    }
+    std::cerr << summary.largest << " bits";
+    if (withErrors) {
+        std::cerr << ", " << counted(summary.bitErrors, "bit error") << ", "
+                  << counted(summary.blockErrors, "block error");
+    }
+    const double seconds = std::max(summary.decoding.count(), 1e-9);  // the clock may stand still
+    std::cerr.precision(2);
+    std::cerr << ", " << std::fixed << static_cast<double>(summary.bits) / seconds / 1e6 << " Mbit/s" << std::endl;
+}
+
+/// Decodes the block that starts at the named place; a refusal becomes an error of that place.
+void decodeBlock(Decoder& decoder,
+                 const SoftValueReader& place,
+                 const SoftBlock& block,
+                 std::uint32_t iterations,
+                 std::uint32_t tag,
+                 std::vector<std::uint8_t>& bits)
+{
+    std::string refusal;
+    try {
+        decoder.decode(block, iterations, tag, bits);
+        if (bits.empty()) {
+            refusal = "holds no bit but those of the tail";
+        }
+    } catch (const Refusal& error) {
+        refusal = "was refused by the decoder (" + std::string(error.what()) + ")";
+    }
+    if (!refusal.empty()) {
+        place.failBlock("block of " + counted(block.size(), "row") + ' ' + refusal + ", allowed are " + allowedRows);
+    }
+}
+
+/// A block's decisions as the line that goes out.
+std::string decisionLine(const std::vector<std::uint8_t>& bits)
+{
+    std::string line;
+    line.reserve(bits.size() + 1);
+    for (const std::uint8_t bit : bits) {
+        line += bit != 0 ? '1' : '0';
+    }
+    return line + '\n';
+}
+
+int decode(const Options& options)
+{
+    InputFile input(options.input);
+    SoftValueReader reader(input.stream(), input.name());
+    std::optional<InputFile> referenceFile;
+    std::optional<ReferenceBits> reference;
+    if (!options.reference.empty()) {
+        referenceFile.emplace(options.reference);
+        reference.emplace(referenceFile->stream(), referenceFile->name());
+    }
+    OutputFile output(options.output, {options.input, options.reference});
+
+    // The decoder's messages must never stand between decisions.
+    std::ostream& messages = output.isStandardOutput() ? std::cerr : std::cout;
+    Decoder decoder(options.decoder.generics, messages);
+    decoder.armTrace(options.tracedPasses);
+
+    Summary summary;
+    SoftBlock block;
+    std::vector<std::uint8_t> bits;
+    while (reader.next(block)) {
+        const auto start = std::chrono::steady_clock::now();
+        decodeBlock(decoder, reader, block, options.decoder.iterations, options.firstTag + summary.blocks, bits);
+        summary.decoding += std::chrono::steady_clock::now() - start;
+        summary.countBlock(bits.size());
+        output.write(decisionLine(bits));
+        if (!messages) {
+            throw FileError("<stdout>", "cannot be written with the decoder's messages");
+        }
+        if (reference) {
+            summary.countErrors(reference->countErrors(bits));
+        }
+    }
+    if (reference) {
+        reference->expectEnd();
+    }
+    print(summary, reference.has_value());
+    return summary.bitErrors > 0 ? differencesFound : success;
+}
+
+/// The end of the help text.
+std::string explanation()
+{
+    return std::string("FILE opens with the line ") + softValueHeader + R"(
+and has one row for each of the K + 4 positions of a block. A new number in the first
+column starts a new block. Each block gives one line of 0 and 1.
+
+Warnings and traces go to the standard error stream, or to standard output when --output
+names a file. Exit status: 0 all decoded, 1 the reference differs, 2 bad input or usage.
+
+Example: decode with eight units, compare with what was sent, and keep the decisions
+  morvik decode k40.csv --num-pu 8 --reference k40.bits --output decided.bits)";
+}
+
+}  // namespace
+
+Command addDecode(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("decode", "Decode blocks of soft values into bits");
+    const auto options = std::make_shared<Options>();
+
+    command->add_option("FILE", options->input, "Soft values, as CSV; - for standard input")
+        ->type_name("")
+        ->capture_default_str();
+    command->add_option("--output", options->output, "File for the decisions; - for standard output")
+        ->type_name("FILE")
+        ->capture_default_str();
+    command->add_option("--reference", options->reference, "Compare with the bits in FILE, one line for each block")
+        ->type_name("FILE");
+    addDecoderOptions(*command, options->decoder);
+    command->add_option("--tag", options->firstTag, "Tag of the first block; the others count up from it")
+        ->transform(integerFrom(0, UINT32_MAX))
+        ->type_name("N")
+        ->capture_default_str();
+    command->add_option("--trace", options->tracedPasses, "Trace the first N half-iterations")
+        ->transform(integerFrom(0, UINT32_MAX))
+        ->type_name("N")
+        ->capture_default_str();
+    command->footer(explanation());
+
+    const auto run = [options] {
+        return decode(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik

@@ -1,0 +1,96 @@
+// Decoder: the C interface of the model as a C++ object.
+#include "Decoder.h"
+
+#include <iostream>
+#include <sstream>
+#include <string>
+
+namespace morvik {
+
+namespace {
+
+/// Holds the process's two output streams redirected for as long as it lives.
+class Redirection {
+public:
+    explicit Redirection(std::ostream& messages)
+        : itsMessages(messages), itsOutput(std::cout.rdbuf(messages.rdbuf())), itsError(std::cerr.rdbuf(&itsErrors))
+    {
+    }
+
+    Redirection(const Redirection&) = delete;
+    Redirection& operator=(const Redirection&) = delete;
+
+    ~Redirection()
+    {
+        const bool written = std::cout.good();
+        std::cout.rdbuf(itsOutput);  // clears the stream's state, and so does the next
+        std::cerr.rdbuf(itsError);
+        if (!written) {
+            itsMessages.setstate(std::ios::badbit);
+        }
+    }
+
+    /// What went to the standard error stream, without the end of its last line.
+    std::string errors() const
+    {
+        std::string text = itsErrors.str();
+        if (!text.empty() && text.back() == '\n') {
+            text.pop_back();
+        }
+        return text;
+    }
+
+private:
+    std::ostream& itsMessages;
+    std::stringbuf itsErrors;
+    std::streambuf* itsOutput;
+    std::streambuf* itsError;
+};
+
+}  // namespace
+
+Decoder::Decoder(const veltra_ip_morvik_v1_0_generics& generics, std::ostream& messages) : itsMessages(messages)
+{
+    const Redirection redirection(itsMessages);
+    itsState.reset(veltra_ip_morvik_v1_0_create_state(generics));
+    if (!itsState) {
+        throw Refusal(redirection.errors());
+    }
+}
+
+void Decoder::armTrace(std::uint32_t passes)
+{
+    veltra_ip_morvik_v1_0_bitacc_dump_config(itsState.get(), passes);
+}
+
+void Decoder::decode(const SoftBlock& block,
+                     std::uint32_t iterations,
+                     std::uint32_t tag,
+                     std::vector<std::uint8_t>& bits)
+{
+    bits.resize(block.size());
+    veltra_ip_morvik_v1_0_outputs outputs{};
+    outputs.dout = bits.data();
+    outputs.dout_alloc = static_cast<std::uint32_t>(bits.size());
+
+    const Redirection redirection(itsMessages);
+    const auto status = veltra_ip_morvik_v1_0_bitacc_simulate(itsState.get(),
+                                                              block.rsc1Sys.data(),
+                                                              block.rsc1Par.data(),
+                                                              block.rsc2Par.data(),
+                                                              static_cast<std::int32_t>(block.size()),
+                                                              iterations,
+                                                              tag,
+                                                              &outputs);
+    if (status != 0) {
+        throw Refusal(redirection.errors());
+    }
+    bits.resize(outputs.dout_size);
+}
+
+void Decoder::Destroy::operator()(veltra_ip_morvik_v1_0_state* state) const
+{
+    veltra_ip_morvik_v1_0_destroy_state(state);
+}
+
+}  // namespace morvik

@@ -1,0 +1,49 @@
+// Decoder: the C interface of the model as a C++ object.
+#ifndef MORVIK_DECODER_H
+#define MORVIK_DECODER_H
+
+#include <morvik_v1_0_bitacc_cmodel.h>
+
+#include <cstdint>
+#include <memory>
+#include <ostream>
+#include <stdexcept>
+#include <vector>
+
+#include "SoftBlock.h"
+
+namespace morvik {
+
+/// The library refused; the text is the line in which it told why.
+class Refusal : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+/// A decoder, whose warnings and traces go to a stream of the caller's choice.
+///
+/// The library writes to std::cout and std::cerr. During each call those two are redirected: the first to
+/// `messages`, the second into the text of a Refusal. When `messages` cannot be written, its badbit is set.
+class Decoder {
+public:
+    /// Throws Refusal when the generics are not allowed. `messages` outlives the decoder.
+    Decoder(const veltra_ip_morvik_v1_0_generics& generics, std::ostream& messages);
+
+    /// Traces the next `passes` half-iterations, counted across blocks.
+    void armTrace(std::uint32_t passes);
+
+    /// Decodes a block into `bits`, one element of 0 or 1 for each bit. Throws Refusal.
+    void decode(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag, std::vector<std::uint8_t>& bits);
+
+private:
+    struct Destroy {
+        void operator()(veltra_ip_morvik_v1_0_state* state) const;
+    };
+
+    std::ostream& itsMessages;
+    std::unique_ptr<veltra_ip_morvik_v1_0_state, Destroy> itsState;
+};
+
+}  // namespace morvik
+
+#endif

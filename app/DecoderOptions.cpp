@@ -1,0 +1,31 @@
+// DecoderOptions: the options that every decoding subcommand shares.
+#include "DecoderOptions.h"
+
+#include "Arguments.h"
+
+namespace morvik {
+
+void addDecoderOptions(CLI::App& command, DecoderOptions& options)
+{
+    command.add_option("--num-pu", options.generics.C_NUM_PU, "Parallel processing units: 2, 4 or 8")
+        ->transform(oneOf({{"2", "2"}, {"4", "4"}, {"8", "8"}}))
+        ->type_name("N")
+        ->capture_default_str();
+    command
+        .add_option("--algorithm",
+                    options.generics.C_ALGORITHM_TYPE,
+                    "0 or max-log: max-log-MAP; 1 or scaled: extrinsic values times 0.75; 2 or table: correction table")
+        ->transform(oneOf({{"0", "0"}, {"1", "1"}, {"2", "2"}, {"max-log", "0"}, {"scaled", "1"}, {"table", "2"}}))
+        ->type_name("TYPE")
+        ->capture_default_str();
+    command.add_option("--iterations", options.iterations, "Turbo iterations, 1 to 15")
+        ->transform(integerFrom(1, 15))
+        ->type_name("N")
+        ->capture_default_str();
+    command.add_option("--tag-width", options.generics.C_TAG_WIDTH, "Bits of the block tag, 0 to 32")
+        ->transform(integerFrom(0, 32))
+        ->type_name("N")
+        ->capture_default_str();
+}
+
+}  // namespace morvik

@@ -1,0 +1,83 @@
+// Files: the files and standard streams that a command reads and writes, and what can go wrong with them.
+#include "Files.h"
+
+#include <cerrno>
+#include <filesystem>
+#include <iostream>
+#include <system_error>
+
+namespace morvik {
+
+namespace {
+
+bool isSameFile(const std::string& a, const std::string& b)
+{
+    std::error_code ignored;  // a path that does not exist is no file yet
+    return std::filesystem::is_regular_file(a, ignored) && std::filesystem::equivalent(a, b, ignored);
+}
+
+}  // namespace
+
+FileError::FileError(const std::string& file, const std::string& what) : std::runtime_error(file + ": " + what) {}
+
+FileError::FileError(const std::string& file, std::size_t line, const std::string& what)
+    : std::runtime_error(file + ':' + std::to_string(line) + ": " + what)
+{
+}
+
+std::string cannotBe(const std::string& action)
+{
+    return "cannot be " + action + ": " + std::generic_category().message(errno);
+}
+
+InputFile::InputFile(const std::string& path)
+    : itsName(path == standardStream ? "<stdin>" : path), itsStream(path == standardStream ? std::cin : itsFile)
+{
+    if (path != standardStream) {
+        itsFile.open(path, std::ios::binary);
+        if (!itsFile) {
+            throw FileError(itsName, cannotBe("opened"));
+        }
+    }
+}
+
+std::istream& InputFile::stream()
+{
+    return itsStream;
+}
+
+const std::string& InputFile::name() const
+{
+    return itsName;
+}
+
+OutputFile::OutputFile(const std::string& path, const std::vector<std::string>& inputs)
+    : itsName(path == standardStream ? "<stdout>" : path), itsStream(path == standardStream ? std::cout : itsFile)
+{
+    if (isStandardOutput()) {
+        return;
+    }
+    for (const std::string& input : inputs) {
+        if (isSameFile(path, input)) {
+            throw FileError(itsName, "is read as " + input + ", the decisions need a file of their own");
+        }
+    }
+    itsFile.open(path, std::ios::binary);
+    if (!itsFile) {
+        throw FileError(itsName, cannotBe("written"));
+    }
+}
+
+bool OutputFile::isStandardOutput() const
+{
+    return &itsStream == &std::cout;
+}
+
+void OutputFile::write(const std::string& text)
+{
+    if (!(itsStream << text << std::flush)) {
+        throw FileError(itsName, cannotBe("written"));
+    }
+}
+
+}  // namespace morvik

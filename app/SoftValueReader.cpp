@@ -1,0 +1,120 @@
+// SoftValueReader: blocks of soft values from CSV text.
+#include "SoftValueReader.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <string_view>
+
+#include "Text.h"
+
+namespace morvik {
+
+namespace {
+
+/// Takes the text up to the next comma, or all of it, off the front of `row`.
+std::string_view takeField(std::string_view& row)
+{
+    const std::string_view field = row.substr(0, row.find(','));
+    row.remove_prefix(std::min(field.size() + 1, row.size()));
+    return field;
+}
+
+bool isLabel(std::string_view text)
+{
+    return !text.empty() && std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+}
+
+}  // namespace
+
+SoftValueReader::SoftValueReader(std::istream& input, const std::string& name) : itsLines(input, name)
+{
+    const std::string header = shown(softValueHeader);
+    if (!itsLines.next()) {
+        itsLines.fail("no header, expected " + header);
+    }
+    if (itsLines.text() != softValueHeader) {
+        itsLines.fail("wrong header " + shown(itsLines.text()) + ", expected " + header);
+    }
+    advance();
+    if (itsAtEnd) {
+        itsLines.fail("no rows after the header, expected at least one block");
+    }
+}
+
+bool SoftValueReader::next(SoftBlock& block)
+{
+    block.rsc1Sys.clear();
+    block.rsc1Par.clear();
+    block.rsc2Par.clear();
+    if (itsAtEnd) {
+        return false;
+    }
+    itsFirstLine = itsLines.number();
+    const std::string label = itsLabel;
+    while (!itsAtEnd && itsLabel == label) {
+        if (block.size() == maxPositions) {
+            failBlock("block of more than " + std::to_string(maxPositions) + " rows, allowed are " + allowedRows);
+        }
+        appendRow(block);
+        advance();
+    }
+    return true;
+}
+
+void SoftValueReader::failBlock(const std::string& what) const
+{
+    itsLines.failAt(itsFirstLine, what);
+}
+
+void SoftValueReader::advance()
+{
+    itsAtEnd = !itsLines.next();
+    if (itsAtEnd) {
+        return;
+    }
+    if (itsLines.text().empty()) {
+        expectOnlyBlankLines();
+        itsAtEnd = true;
+        return;
+    }
+    std::string_view row = itsLines.text();
+    itsLabel = takeField(row);
+    if (!isLabel(itsLabel)) {
+        itsLines.fail("block " + shown(itsLabel) + " is no label, allowed are non-negative integers");
+    }
+}
+
+void SoftValueReader::expectOnlyBlankLines()
+{
+    const std::size_t first = itsLines.number();
+    while (itsLines.next()) {
+        if (!itsLines.text().empty()) {
+            itsLines.failAt(first, "blank line, allowed at the end only");
+        }
+    }
+}
+
+void SoftValueReader::appendRow(SoftBlock& block) const
+{
+    std::string_view row = itsLines.text();
+    const auto fields = std::count(row.begin(), row.end(), ',') + 1;
+    if (fields != 4) {
+        itsLines.fail(std::to_string(fields) + (fields == 1 ? " field" : " fields") + ", expected the four of " +
+                      shown(softValueHeader));
+    }
+    takeField(row);  // the label
+    const auto takeValue = [&](const char* column) {
+        const std::string_view field = takeField(row);
+        const auto value = parseInteger<std::int32_t>(field);
+        if (!value) {
+            itsLines.fail(std::string(column) + ' ' + shown(field) +
+                          " is not allowed, allowed are the integers -2147483648 to 2147483647");
+        }
+        return *value;
+    };
+    block.rsc1Sys.push_back(takeValue("rsc1_sys"));
+    block.rsc1Par.push_back(takeValue("rsc1_par"));
+    block.rsc2Par.push_back(takeValue("rsc2_par"));
+}
+
+}  // namespace morvik

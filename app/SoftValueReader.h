@@ -1,0 +1,51 @@
+// SoftValueReader: blocks of soft values from CSV text.
+#ifndef MORVIK_SOFT_VALUE_READER_H
+#define MORVIK_SOFT_VALUE_READER_H
+
+#include <cstddef>
+#include <istream>
+#include <string>
+
+#include "LineReader.h"
+#include "SoftBlock.h"
+
+namespace morvik {
+
+/// The first line of the text.
+constexpr char softValueHeader[] = "block,rsc1_sys,rsc1_par,rsc2_par";
+
+/// How many rows a block may have, for messages.
+constexpr char allowedRows[] = "K + 4 rows, K being one of the block sizes of 3GPP TS 36.212 (40 to 6144)";
+
+/// Reads one block at a time.
+///
+/// After the header, each row has four decimal integers: the label of its block, a non-negative integer of any
+/// length, and three soft values of 32 bits. A row whose label differs, as text, from that of the row before starts
+/// a new block. Blank lines are allowed at the end only. Whatever is wrong is thrown as a FileError naming the line.
+class SoftValueReader {
+public:
+    /// Reads the header. `input` outlives the reader; `name` is what messages call it.
+    SoftValueReader(std::istream& input, const std::string& name);
+
+    /// Reads the next block; false at the end. A mistake in the row that follows the block is left to the next call,
+    /// so that the block itself is not lost.
+    bool next(SoftBlock& block);
+
+    /// Throws a FileError about the first line of the block just read.
+    [[noreturn]] void failBlock(const std::string& what) const;
+
+private:
+    /// Goes to the next row and reads its label.
+    void advance();
+    void expectOnlyBlankLines();
+    void appendRow(SoftBlock& block) const;
+
+    LineReader itsLines;
+    bool itsAtEnd = false;
+    std::string itsLabel;  // of the current row, which no block has yet
+    std::size_t itsFirstLine = 0;
+};
+
+}  // namespace morvik
+
+#endif

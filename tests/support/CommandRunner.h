@@ -1,0 +1,66 @@
+// CommandRunner: runs a program as a user's shell would, and keeps what it printed.
+#ifndef MORVIK_TESTS_COMMAND_RUNNER_H
+#define MORVIK_TESTS_COMMAND_RUNNER_H
+
+#include <sys/types.h>
+
+#include <string>
+#include <vector>
+
+namespace support {
+
+/// What a finished program leaves behind.
+struct CommandResult {
+    int status;  // exit status, or minus the number of the signal that ended it
+    std::string out;
+    std::string err;
+};
+
+/// A program that runs while the test goes on.
+class Process {
+public:
+    /// Starts it in a directory, with the given descriptors as its standard streams.
+    Process(const std::string& program,
+            const std::vector<std::string>& arguments,
+            const std::string& directory,
+            const int (&streams)[3]);
+
+    /// Waits for the end; the status is that of CommandResult.
+    int wait();
+
+private:
+    pid_t itsId;
+};
+
+/// Runs a program in a directory of its own, which goes with the runner.
+class CommandRunner {
+public:
+    explicit CommandRunner(std::string program);
+    CommandRunner(const CommandRunner&) = delete;
+    CommandRunner& operator=(const CommandRunner&) = delete;
+    ~CommandRunner();
+
+    const std::string& program() const;
+    const std::string& directory() const;
+
+    /// Writes a file in the directory.
+    void write(const std::string& file, const std::string& text) const;
+
+    /// The content of a file, its name being relative to the directory.
+    std::string read(const std::string& file) const;
+
+    /// Runs the program to its end. An empty `output` keeps the standard output for the result.
+    CommandResult run(const std::vector<std::string>& arguments,
+                      const std::string& input = "/dev/null",
+                      const std::string& output = "") const;
+
+private:
+    std::string path(const std::string& file) const;
+
+    std::string itsProgram;
+    std::string itsDirectory;
+};
+
+}  // namespace support
+
+#endif
