@@ -1,6 +1,4 @@
 // The command morvik and its files: which it accepts, which it refuses, and in what words.
-#include <unistd.h>
-
 #include <filesystem>
 #include <regex>
 
@@ -88,16 +86,12 @@ TEST_F(CommandFiles, RefusesAMissingFile)
     EXPECT_EQ(result.err, "morvik decode: missing.csv: cannot be opened: No such file or directory\n");
 }
 
-TEST_F(CommandFiles, RefusesAnUnreadableFile)
+TEST_F(CommandFiles, RefusesAFileThatCannotBeOpened)
 {
-    if (geteuid() == 0) {
-        GTEST_SKIP() << "root may read every file";
-    }
-    morvik.write("secret.csv", twoBlocks());
-    std::filesystem::permissions(morvik.directory() + "/secret.csv", std::filesystem::perms::none);
-    const CommandResult result = morvik.run({"decode", "secret.csv"});
+    std::filesystem::create_symlink("loop.csv", morvik.directory() + "/loop.csv");  // stops root as well
+    const CommandResult result = morvik.run({"decode", "loop.csv"});
     EXPECT_EQ(result.status, 2);
-    EXPECT_EQ(result.err, "morvik decode: secret.csv: cannot be opened: Permission denied\n");
+    EXPECT_EQ(result.err, "morvik decode: loop.csv: cannot be opened: Too many levels of symbolic links\n");
 }
 
 TEST_F(CommandFiles, RefusesADirectory)
