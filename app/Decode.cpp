@@ -24,7 +24,7 @@ namespace {
 struct Options {
     std::string input = standardStream;
     std::string output = standardStream;
-    std::string reference;  // empty: none
+    std::optional<std::string> reference;
     DecoderOptions decoder;
     std::uint32_t firstTag = 0;
     std::uint32_t tracedPasses = 0;
@@ -77,6 +77,15 @@ void print(const Summary& summary, bool withErrors)
     std::cerr << ", " << std::fixed << static_cast<double>(summary.bits) / seconds / 1e6 << " Mbit/s" << std::endl;
 }
 
+/// The tag of a block. After the first one, tags count within the bits that the core carries, so that only a tag
+/// that the user gave can be truncated.
+std::uint32_t tagOf(std::uint32_t block, const Options& options)
+{
+    const auto width = static_cast<std::uint32_t>(options.decoder.generics.C_TAG_WIDTH);
+    const std::uint32_t carried = (std::uint32_t{1} << (width % 32)) - 1;
+    return block == 0 ? options.firstTag : (options.firstTag + block) & carried;
+}
+
 /// Decodes the block that starts at the named place; a refusal becomes an error of that place.
 void decodeBlock(Decoder& decoder,
                  const SoftValueReader& place,
@@ -116,11 +125,11 @@ int decode(const Options& options)
     SoftValueReader reader(input.stream(), input.name());
     std::optional<InputFile> referenceFile;
     std::optional<ReferenceBits> reference;
-    if (!options.reference.empty()) {
-        referenceFile.emplace(options.reference);
+    if (options.reference) {
+        referenceFile.emplace(*options.reference);
         reference.emplace(referenceFile->stream(), referenceFile->name());
     }
-    OutputFile output(options.output, {options.input, options.reference});
+    OutputFile output(options.output, {options.input, options.reference.value_or(standardStream)});
 
     // The decoder's messages must never stand between decisions.
     std::ostream& messages = output.isStandardOutput() ? std::cerr : std::cout;
@@ -132,12 +141,13 @@ int decode(const Options& options)
     std::vector<std::uint8_t> bits;
     while (reader.next(block)) {
         const auto start = std::chrono::steady_clock::now();
-        decodeBlock(decoder, reader, block, options.decoder.iterations, options.firstTag + summary.blocks, bits);
+        decodeBlock(decoder, reader, block, options.decoder.iterations, tagOf(summary.blocks, options), bits);
         summary.decoding += std::chrono::steady_clock::now() - start;
         summary.countBlock(bits.size());
         output.write(decisionLine(bits));
         if (!messages) {
-            throw FileError("<stdout>", "cannot be written with the decoder's messages");
+            throw FileError(output.isStandardOutput() ? "<stderr>" : "<stdout>",
+                            "cannot be written with the decoder's messages");
         }
         if (reference) {
             summary.countErrors(reference->countErrors(bits));
@@ -155,7 +165,8 @@ std::string explanation()
 {
     return std::string("FILE opens with the line ") + softValueHeader + R"(
 and has one row for each of the K + 4 positions of a block. A new number in the first
-column starts a new block. Each block gives one line of 0 and 1.
+column starts a new block. Each block gives one line of 0 and 1. Soft values are clipped to
+-128 ... 127, after the core has cut them to their low 24 bits.
 
 Warnings and traces go to the standard error stream, or to standard output when --output
 names a file. Exit status: 0 all decoded, 1 the reference differs, 2 bad input or usage.
@@ -184,7 +195,7 @@ Command addDecode(CLI::App& app)
         ->transform(integerFrom(0, UINT32_MAX))
         ->type_name("N")
         ->capture_default_str();
-    command->add_option("--trace", options->tracedPasses, "Trace the first N half-iterations")
+    command->add_option("--trace", options->tracedPasses, "Trace the first N half-iterations, counted across blocks")
         ->transform(integerFrom(0, UINT32_MAX))
         ->type_name("N")
         ->capture_default_str();

@@ -2,8 +2,6 @@
 #ifndef MORVIK_DECODER_H
 #define MORVIK_DECODER_H
 
-#include <morvik_v1_0_bitacc_cmodel.h>
-
 #include <cstdint>
 #include <memory>
 #include <ostream>
@@ -11,6 +9,7 @@
 #include <vector>
 
 #include "SoftBlock.h"
+#include "morvik_v1_0_bitacc_cmodel.h"
 
 namespace morvik {
 

@@ -1,11 +1,11 @@
 // DecoderOptions: the options that every decoding subcommand shares.
-#ifndef MORVIK_DECODER_OPTIONS_H
-#define MORVIK_DECODER_OPTIONS_H
-
-#include <morvik_v1_0_bitacc_cmodel.h>
+#ifndef MORVIK_DECODEROPTIONS_H
+#define MORVIK_DECODEROPTIONS_H
 
 #include <CLI/CLI.hpp>
 #include <cstdint>
+
+#include "morvik_v1_0_bitacc_cmodel.h"
 
 namespace morvik {
 

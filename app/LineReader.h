@@ -1,6 +1,6 @@
 // LineReader: a text read line by line, with the place for messages.
-#ifndef MORVIK_LINE_READER_H
-#define MORVIK_LINE_READER_H
+#ifndef MORVIK_LINEREADER_H
+#define MORVIK_LINEREADER_H
 
 #include <cstddef>
 #include <istream>

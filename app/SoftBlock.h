@@ -1,6 +1,6 @@
 // SoftBlock: the soft values of one code block.
-#ifndef MORVIK_SOFT_BLOCK_H
-#define MORVIK_SOFT_BLOCK_H
+#ifndef MORVIK_SOFTBLOCK_H
+#define MORVIK_SOFTBLOCK_H
 
 #include <cstddef>
 #include <cstdint>

@@ -36,7 +36,7 @@ SoftValueReader::SoftValueReader(std::istream& input, const std::string& name) :
         itsLines.fail("wrong header " + shown(itsLines.text()) + ", expected " + header);
     }
     advance();
-    if (itsAtEnd) {
+    if (itsAtEnd && !itsMistake) {
         itsLines.fail("no rows after the header, expected at least one block");
     }
 }
@@ -47,6 +47,9 @@ bool SoftValueReader::next(SoftBlock& block)
     block.rsc1Par.clear();
     block.rsc2Par.clear();
     if (itsAtEnd) {
+        if (itsMistake) {
+            throw FileError(*itsMistake);
+        }
         return false;
     }
     itsFirstLine = itsLines.number();
@@ -63,15 +66,27 @@ bool SoftValueReader::next(SoftBlock& block)
 
 void SoftValueReader::failBlock(const std::string& what) const
 {
+    if (itsMistake) {
+        throw FileError(*itsMistake);
+    }
     itsLines.failAt(itsFirstLine, what);
 }
 
 void SoftValueReader::advance()
 {
-    itsAtEnd = !itsLines.next();
-    if (itsAtEnd) {
-        return;
+    try {
+        itsAtEnd = !itsLines.next();
+        if (!itsAtEnd) {
+            readLabel();
+        }
+    } catch (const FileError& mistake) {
+        itsMistake = mistake;
+        itsAtEnd = true;
     }
+}
+
+void SoftValueReader::readLabel()
+{
     if (itsLines.text().empty()) {
         expectOnlyBlankLines();
         itsAtEnd = true;

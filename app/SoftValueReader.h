@@ -1,11 +1,13 @@
 // SoftValueReader: blocks of soft values from CSV text.
-#ifndef MORVIK_SOFT_VALUE_READER_H
-#define MORVIK_SOFT_VALUE_READER_H
+#ifndef MORVIK_SOFTVALUEREADER_H
+#define MORVIK_SOFTVALUEREADER_H
 
 #include <cstddef>
 #include <istream>
+#include <optional>
 #include <string>
 
+#include "Files.h"
 #include "LineReader.h"
 #include "SoftBlock.h"
 
@@ -28,20 +30,22 @@ public:
     SoftValueReader(std::istream& input, const std::string& name);
 
     /// Reads the next block; false at the end. A mistake in the row that follows the block is left to the next call,
-    /// so that the block itself is not lost.
+    /// so that the block itself is not lost: only if that row has a label can one tell that it belongs to another.
     bool next(SoftBlock& block);
 
-    /// Throws a FileError about the first line of the block just read.
+    /// Throws a FileError about the first line of the block just read, or about the mistake that cut it short.
     [[noreturn]] void failBlock(const std::string& what) const;
 
 private:
-    /// Goes to the next row and reads its label.
+    /// Goes to the next row and reads its label; a mistake ends the rows and is kept.
     void advance();
+    void readLabel();
     void expectOnlyBlankLines();
     void appendRow(SoftBlock& block) const;
 
     LineReader itsLines;
     bool itsAtEnd = false;
+    std::optional<FileError> itsMistake;
     std::string itsLabel;  // of the current row, which no block has yet
     std::size_t itsFirstLine = 0;
 };

@@ -12,7 +12,7 @@
  *   4. veltra_ip_morvik_v1_0_destroy_state          releases the decoder
  *
  * Messages
- *   The library reports in single lines, each flushed as it is written: errors ("ERROR:...") on the
+ *   The library reports in single lines, each written at once and flushed: errors ("ERROR:...") on the
  *   process's standard error stream, warnings ("WARNING:...") and traces on its standard output
  *   stream (std::cerr and std::cout of the C++ library that it is linked to). A program that wants
  *   them elsewhere replaces the stream buffers of those two streams around its calls.
@@ -143,7 +143,7 @@ MORVIK_API void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state*
  *     0   decoded: `dout` holds K decisions, `dout_size` is K, `tag` is the masked tag
  *     1   an argument was refused, or `dout_alloc` is less than K
  *     2   the decoder refused the block
- *    99   the decoder ran out of memory (or met another exception)
+ *    99   the decoder ran out of memory (or met another exception); so it does for a K of many millions
  * On every status but 0 the outputs are left as they were, and one line tells why:
  *
  *     1   ERROR:decoder:Simulate called with null state structure
@@ -172,8 +172,8 @@ MORVIK_API void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state*
  * and "positively" or "negatively". A C_TAG_WIDTH of 32 keeps no bit of the tag, as 0 does: the
  * hardware forms the mask with a shift count of five bits.
  *
- * The buffers of soft values are built before the decoder is called; memory exhausted at that
- * moment leaves the function as a C++ std::bad_alloc.
+ * The buffer of soft values is built before the decoder is called; memory exhausted at that moment
+ * leaves the function as a C++ exception, std::bad_alloc or std::length_error.
  */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state,
                                                          const int32_t* rsc1_sys,
@@ -190,16 +190,23 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_s
 /* Arms the decoder's trace for the next `count` soft-in/soft-out passes, two for each iteration,
  * counted across blocks; 0 switches it off. The state must be a live one.
  *
- * While the count lasts, each block first prints its six input streams and each pass prints a
- * table with one row for each trellis step: the intrinsic value, the eight forward and the eight
- * backward metrics, the branch metric columns g4 to g7, the log-likelihood ratio and the extrinsic
- * value. Metrics of the three tail steps, and g4 to g7, are cells that no computation writes.
+ * While the count lasts, each block prints its six input streams and each pass prints a table with
+ * one row for each of the K + 3 trellis steps, on the standard output stream: the intrinsic value,
+ * the forward metrics a0 to a7, the backward metrics b0 to b7, the elements g4 to g7 of the branch
+ * metric column, the log-likelihood ratio and the extrinsic value. No computation writes g4 to g7,
+ * the forward metrics of the last two steps, and the backward metrics of the last three; these
+ * cells, and the ratio and extrinsic value of the last three steps, show zeros or what an earlier
+ * block left there.
+ *
+ * A block whose size is refused prints nothing and leaves the count alone. One that is refused
+ * because `dout_alloc` is too small has been decoded: it prints, and counts. What one call prints
+ * comes in this order: saturation warning, input streams, tables, tag warning.
  */
 MORVIK_API void veltra_ip_morvik_v1_0_bitacc_dump_config(veltra_ip_morvik_v1_0_state* state, uint32_t count);
 
 /* Returns a new state record with a copy of the generics and no component in it, for test benches
- * that put in components of their own; null after a line on the standard error stream when memory
- * is exhausted. Checks nothing. Released with destroy_state.
+ * that put in components of their own before any other call but destroy_state, which releases it;
+ * null after a line on the standard error stream when memory is exhausted. Checks nothing.
  */
 MORVIK_API veltra_ip_morvik_v1_0_state* create_default_state(veltra_ip_morvik_v1_0_generics generics);
 #endif

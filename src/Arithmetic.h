@@ -1,4 +1,4 @@
-// Arithmetic: every wrap, shift, clip and mask of the hardware's numbers, each stated once.
+// Arithmetic: the wraps, shifts, clips and masks of the hardware's numbers, each stated once.
 //
 // The numbered rules are those of docs/arithmetic.md. All functions are defined for every argument:
 // what the hardware loses in a register is computed in unsigned arithmetic here.
@@ -30,7 +30,8 @@ constexpr std::int32_t shiftRight(std::int32_t value, std::uint32_t count)
     return value >> (count & 31U);
 }
 
-/// value held between lo and hi. Requires lo <= hi.
+/// value held between lo and hi, lo <= hi. (For lo > hi, which no format in use gives, a value below lo
+/// becomes lo.)
 template <class Number>
 constexpr Number clip(Number value, Number lo, Number hi)
 {
@@ -49,10 +50,16 @@ constexpr Value subWrap(Value a, Value b)
     return wrap16(std::int32_t{a} - b);
 }
 
+/// c2 when the wrapped difference of two candidates is negative, c1 otherwise (rule 3).
+constexpr Value select(Value difference, Value c1, Value c2)
+{
+    return difference < 0 ? c2 : c1;
+}
+
 /// The greater of two metrics, told by the sign of their wrapped difference; a tie gives c1 (rule 3).
 constexpr Value maxWrap(Value c1, Value c2)
 {
-    return subWrap(c1, c2) < 0 ? c2 : c1;
+    return select(subWrap(c1, c2), c1, c2);
 }
 
 /// The bits of value that mask selects.

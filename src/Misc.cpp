@@ -14,9 +14,9 @@
 
 namespace {
 
-constexpr std::uint32_t kSecondsPerMinute = 60;
-constexpr std::uint32_t kSecondsPerHour = 3600;
-constexpr std::uint32_t kSecondsPerDay = 259200;  // three times 86400, on purpose, in both directions
+constexpr std::uint32_t secondsPerMinute = 60;
+constexpr std::uint32_t secondsPerHour = 3600;
+constexpr std::uint32_t secondsPerDay = 259200;  // three times 86400, on purpose, in both directions
 
 /// Blanks are the codes up to 32 of a signed character, hence also the bytes 128 to 255.
 bool isBlank(char c)
@@ -117,8 +117,8 @@ std::string toFixed(long double value, unsigned precision)
     // No value has more digits than this after the point. The zeros behind them are appended here,
     // since the stream would lay them out on the stack, which a large precision overflows.
     using Limits = std::numeric_limits<long double>;
-    constexpr unsigned kMostDigits = Limits::digits - Limits::min_exponent;
-    const unsigned digits = std::min(precision, kMostDigits);
+    constexpr unsigned mostDigits = Limits::digits - Limits::min_exponent;
+    const unsigned digits = std::min(precision, mostDigits);
 
     std::ostringstream os;
     makePlain(os);
@@ -283,14 +283,14 @@ std::string timeToString(std::uint32_t seconds)
 {
     std::ostringstream os;
     makePlain(os);
-    if (seconds < kSecondsPerMinute) {
+    if (seconds < secondsPerMinute) {
         os << seconds << "s";
-    } else if (seconds < kSecondsPerHour) {
-        os << static_cast<double>(seconds) / kSecondsPerMinute << "min";
-    } else if (seconds < kSecondsPerDay) {
-        os << static_cast<double>(seconds) / kSecondsPerHour << "hr";
+    } else if (seconds < secondsPerHour) {
+        os << static_cast<double>(seconds) / secondsPerMinute << "min";
+    } else if (seconds < secondsPerDay) {
+        os << static_cast<double>(seconds) / secondsPerHour << "hr";
     } else {
-        os << static_cast<double>(seconds) / kSecondsPerDay << "days";
+        os << static_cast<double>(seconds) / secondsPerDay << "days";
     }
     return os.str();
 }
@@ -319,13 +319,13 @@ std::int32_t stringToTime(std::string text)
     long double seconds = number;
     switch (toUpperAscii(unit)) {
     case 'M':
-        seconds *= kSecondsPerMinute;
+        seconds *= secondsPerMinute;
         break;
     case 'H':
-        seconds *= kSecondsPerHour;
+        seconds *= secondsPerHour;
         break;
     case 'D':
-        seconds *= kSecondsPerDay;
+        seconds *= secondsPerDay;
         break;
     default:
         break;

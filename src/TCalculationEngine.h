@@ -28,19 +28,20 @@ public:
     virtual std::string getProperties() const = 0;
 
     /// Makes the engine ready once its formats are set; false means that it cannot be used. The
-    /// base warns on the standard output stream when the state format leaves no spare bit, and
-    /// returns true.
+    /// base returns true, and warns on the standard output stream when the state format has more
+    /// than 16 bits, so that its mask is empty.
     virtual bool initialise();
 
     /// Branch metrics: g[k], elements 0 to 3, from intrinsic[k], parity0[k] and parity1[k], for
     /// k = 0 to n - 1. Returns g + n.
     virtual T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) = 0;
 
-    /// Forward state metrics: a[j + 1] from a[j] and g[j], a[0] given, up to a[n - 1]. Returns a + n.
+    /// Forward state metrics: a[j + 1] from a[j] and g[j], a[0] given, up to a[n - 1], n >= 1. Returns
+    /// a + n.
     virtual T8* alpha(unsigned n, const T8* g, T8* a) = 0;
 
-    /// Backward state metrics: b[-j - 1] from b[-j] and g[-j], b[0] given, down to b[-(n - 1)].
-    /// Returns b - n.
+    /// Backward state metrics: b[-j - 1] from b[-j] and g[-j], b[0] given, down to b[-(n - 1)],
+    /// n >= 1. Returns b - n.
     virtual T8* beta(unsigned n, const T8* g, T8* b) = 0;
 
     /// Log-likelihood ratios: out[k] from a[k], b[k] and g[k], for k = 0 to n - 1; positive favours

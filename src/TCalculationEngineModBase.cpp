@@ -10,6 +10,7 @@
 
 #include "Arithmetic.h"
 #include "Messages.h"
+#include "TraceTable.h"
 #include "Trellis.h"
 #include "TrellisDecision.h"
 
@@ -307,4 +308,76 @@ std::istream& operator>>(std::istream& is, TCalculationEngineModBase::AlgorithmT
         type = TCalculationEngineModBase::MOD;
     }
     return is;
+}
+
+void dumpGamma(std::ostream& os,
+               unsigned n,
+               const short* intrinsic,
+               const short* parity0,
+               const short* parity1,
+               const T8* g1,
+               const T8* g2,
+               const TNumberFormat& format)
+{
+    messages::writeLine(os,
+                        "n    intrinsic   parity0     parity1        g1[0]        g1[1]        g1[2]        g1[3]  "
+                        "        g2[0]        g2[1]        g2[2]        g2[3]");
+    TraceRow row(format);
+    for (unsigned k = 0; k < n; ++k) {
+        row.begin(k);
+        row.value(intrinsic[k]);
+        row.value(parity0[k]);
+        row.value(parity1[k]);
+        row.gap();
+        row.compared(g1[k], g2[k], 0, 3);
+        row.gap();
+        row.compared(g2[k], g1[k], 0, 3);
+        row.end(os);
+    }
+}
+
+void dumpAlphaBeta(std::ostream& os, unsigned n, const T8* g, const T8* ab1, const T8* ab2, const TNumberFormat& format)
+{
+    messages::writeLine(os,
+                        "n    g4          g5          g6          g7             ab1[0]       ab1[1]       ab1[2]   "
+                        "    ab1[3]       ab1[4]       ab1[5]       ab1[6]       ab1[7]         ab2[0]       ab2[1]  "
+                        "     ab2[2]       ab2[3]       ab2[4]       ab2[5]       ab2[6]       ab2[7]");
+    TraceRow row(format);
+    for (unsigned k = 0; k < n; ++k) {
+        row.begin(k);
+        row.values(g[k], 4, 7);
+        row.gap();
+        row.compared(ab1[k], ab2[k], 0, 7);
+        row.gap();
+        row.compared(ab2[k], ab1[k], 0, 7);
+        row.end(os);
+    }
+}
+
+void dumpExtrinsic(std::ostream& os,
+                   unsigned n,
+                   const T8* a,
+                   const T8* b,
+                   const T8* g,
+                   const short* e1,
+                   const short* e2,
+                   const TNumberFormat& format)
+{
+    messages::writeLine(os,
+                        "n    a[0]        a[1]        a[2]        a[3]        a[4]        a[5]        a[6]        "
+                        "a[7]          b[0]        b[1]        b[2]        b[3]        b[4]        b[5]        b[6]  "
+                        "      b[7]          g[4]        g[5]        g[6]        g[7]           e1           e2");
+    TraceRow row(format);
+    for (unsigned k = 0; k < n; ++k) {
+        row.begin(k);
+        row.values(a[k], 0, 7);
+        row.gap();
+        row.values(b[k], 0, 7);
+        row.gap();
+        row.values(g[k], 4, 7);
+        row.gap();
+        row.compared(e1[k], e2[k]);
+        row.compared(e2[k], e1[k]);
+        row.end(os);
+    }
 }

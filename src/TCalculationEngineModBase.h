@@ -64,4 +64,33 @@ MORVIK_API std::ostream& operator<<(std::ostream& os, TCalculationEngineModBase:
 /// end. Anything else leaves the type UNKNOWN and the offending character unread.
 MORVIK_API std::istream& operator>>(std::istream& is, TCalculationEngineModBase::AlgorithmType& type);
 
+/// Tables of kernel values for tracing and for comparing two implementations: a header line, then a
+/// row for each of n trellis steps, values as real numbers of `format` (the state format for all that
+/// kernels handle). An element in which the two compared arrays differ has "*" before it.
+
+/// The inputs of gamma, and two columns of branch metrics, elements 0 to 3, compared.
+MORVIK_API void dumpGamma(std::ostream& os,
+                          unsigned n,
+                          const short* intrinsic,
+                          const short* parity0,
+                          const short* parity1,
+                          const T8* g1,
+                          const T8* g2,
+                          const TNumberFormat& format);
+
+/// Elements 4 to 7 of g, and two columns of state metrics compared.
+MORVIK_API void dumpAlphaBeta(
+    std::ostream& os, unsigned n, const T8* g, const T8* ab1, const T8* ab2, const TNumberFormat& format);
+
+/// The columns that a ratio or extrinsic value comes from, elements 4 to 7 of g among them, and two
+/// such values compared.
+MORVIK_API void dumpExtrinsic(std::ostream& os,
+                              unsigned n,
+                              const T8* a,
+                              const T8* b,
+                              const T8* g,
+                              const short* e1,
+                              const short* e2,
+                              const TNumberFormat& format);
+
 #endif

@@ -20,14 +20,15 @@ constexpr const char* tableHeader =
     "            g4          g5          g6          g7            llr         ext";
 
 /// The a-priori value halved, brought back to the format's bits, joined with the systematic value
-/// and halved again; both divisions truncate toward zero (rule 12).
+/// and halved again; both divisions truncate toward zero (rule 13).
 short intrinsicValue(int apriori, int systematic, int stateMask)
 {
     return wrap16((((apriori / 2) & stateMask) + systematic) / 2);
 }
 
-/// An extrinsic value scaled, with the two exact cases of the hardware (rule 13). A general scale
-/// is cut to the limits before it is converted, so that no product leaves the integer's range.
+/// An extrinsic value scaled, with the two exact cases of the hardware (rule 14). A general product
+/// is cut to the limits before it is converted, so that none leaves the integer's range; one that is
+/// not a number becomes the lower limit.
 int scaled(int value, double scale, int lo, int hi)
 {
     if (scale == 1.0) {
@@ -36,7 +37,8 @@ int scaled(int value, double scale, int lo, int hi)
     if (scale == 0.75) {
         return 3 * value / 4;
     }
-    return static_cast<int>(clip<double>(value * scale, lo, hi));
+    const double product = value * scale;
+    return product > lo ? static_cast<int>(std::min<double>(product, hi)) : lo;
 }
 
 /// One line of the input dump: "label[d]=[" and the values with single blanks between them.
@@ -138,7 +140,7 @@ bool TDecoder3G::extract(const std::vector<short>& soft)
     if (!allocate(K + tailSteps)) {
         return false;
     }
-    SoftValues next = soft.begin();
+    InputPosition next = soft.begin();
     for (unsigned k = 0; k < K; ++k) {
         itsSys[0].push_back(*next++);
         appendParity(0, next);
@@ -159,7 +161,7 @@ bool TDecoder3G::extract(const std::vector<short>& soft)
     return true;
 }
 
-void TDecoder3G::appendParity(unsigned d, SoftValues& next)
+void TDecoder3G::appendParity(unsigned d, InputPosition& next)
 {
     itsPar0[d].push_back(*next++);
     itsPar1[d].push_back(is3GPP2 ? *next++ : short{0});

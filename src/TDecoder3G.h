@@ -42,8 +42,9 @@ public:
 
     void dump(std::ostream& out) override;
 
-    /// Writes a table with one row for each trellis step: intrinsic value, forward, backward and
-    /// branch metrics, log-likelihood ratio and extrinsic value, as real numbers.
+    /// Writes a table with one row for each trellis step: intrinsic value, forward and backward
+    /// metrics, elements 4 to 7 of the branch metric column (which no kernel uses), log-likelihood
+    /// ratio and extrinsic value, as real numbers.
     void dumpFull(std::ostream& out, unsigned int halfIteration) override;
 
     /// The steps of a decode, in order of use; h is the half-iteration. Each returns false when the
@@ -81,10 +82,10 @@ protected:
     static void setUnknownState(T8* column);
 
 private:
-    using SoftValues = std::vector<short>::const_iterator;
+    using InputPosition = std::vector<short>::const_iterator;
 
     /// Takes the parity values of one trellis step of constituent decoder d from the input.
-    void appendParity(unsigned d, SoftValues& next);
+    void appendParity(unsigned d, InputPosition& next);
     bool interleaveSystematic(unsigned K);
     /// Brings the table by which constituent decoder d reads extrinsic values to K entries.
     bool preparePermutation(unsigned d, unsigned K) const;

@@ -26,7 +26,7 @@ T8 border(const T8& column)
     return kept;
 }
 
-/// The number of segments doubles until every thread has one or they become shorter than 64 steps.
+/// The number of segments doubles until every thread has one or they would become shorter than 64 steps.
 std::uint32_t segmentCount(std::uint32_t K, std::uint64_t threads)
 {
     std::uint64_t count = 1;
@@ -73,6 +73,7 @@ std::string text(const std::vector<TDecoder3GPU::ABSegment>& segments)
 {
     std::ostringstream list;
     list.imbue(std::locale::classic());
+    list.exceptions(std::ios::badbit);  // exhausted memory must not cost a segment unnoticed
     const char* separator = "";
     for (const TDecoder3GPU::ABSegment& segment : segments) {
         list << separator << segment;

@@ -18,8 +18,9 @@
 /// hardware; here they are computed one after the other.
 class MORVIK_API TDecoder3GPU : public TDecoder3G {
 public:
-    /// Trellis steps of a segment, [from,to), or of a window: its last step and, the step before
-    /// its first, the one that its last column belongs to.
+    /// Trellis steps: of a segment the first and the one after the last; of a window the last and
+    /// the one before the first, where the backward recursion ends. The block's first window ends at
+    /// its own first step, 0.
     struct ABSegment {
         std::uint32_t from;
         std::uint32_t to;
@@ -61,7 +62,7 @@ protected:
     static bool preCalcAlpha(unsigned int h, unsigned int i, T8* column);
     static bool preCalcBeta(unsigned int h, unsigned int i, T8* column);
 
-    /// The backward metrics at step K, in closed form from the three tail steps (rule 14).
+    /// The backward metrics at step K, in closed form from the three tail steps (rule 12).
     bool preCalcBetaTail(unsigned int h, T8* column) const;
 
 private:

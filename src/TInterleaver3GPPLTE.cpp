@@ -2,6 +2,7 @@
 #include "TInterleaver3GPPLTE.h"
 
 #include <cstdint>
+#include <iterator>
 
 #include "Messages.h"
 
@@ -15,7 +16,7 @@ struct LteParams {
 
 /// Turbo code internal interleaver parameters: 3GPP TS 36.212, Table 5.1.3-3, K ascending.
 // clang-format off
-constexpr LteParams lteParams[188] = {
+constexpr LteParams lteParams[] = {
     {40, 3, 10}, {48, 7, 12}, {56, 19, 42}, {64, 7, 16}, {72, 7, 18}, {80, 11, 20}, {88, 5, 22}, {96, 11, 24},
     {104, 7, 26}, {112, 41, 84}, {120, 103, 90}, {128, 15, 32}, {136, 9, 34}, {144, 17, 108}, {152, 9, 38},
     {160, 21, 120}, {168, 101, 84}, {176, 21, 44}, {184, 57, 46}, {192, 23, 48}, {200, 13, 50}, {208, 27, 52},
@@ -48,14 +49,17 @@ constexpr LteParams lteParams[188] = {
 };
 // clang-format on
 
+constexpr unsigned lastRow = std::size(lteParams) - 1;
+static_assert(lastRow == 187);
+
 /// The row for block size K, or null when K is no block size.
 const LteParams* findParams(unsigned K)
 {
-    if (K == 0 || K % 8 != 0 || K > 6144) {
+    if (K == 0 || K % 8 != 0 || K > lteParams[lastRow].K) {
         return nullptr;
     }
     unsigned lo = 0;
-    unsigned hi = 187;
+    unsigned hi = lastRow;
     while (lo != hi) {
         const unsigned mid = (lo + hi) / 2;
         if (K <= lteParams[mid].K) {

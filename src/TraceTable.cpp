@@ -7,13 +7,14 @@
 TraceRow::TraceRow(const TNumberFormat& format) : itsFormat(format)
 {
     itsText.imbue(std::locale::classic());
-    itsText << std::left << std::fixed << std::setprecision(6);
+    itsText.exceptions(std::ios::badbit);  // exhausted memory must not cost a row unnoticed
+    itsText << std::left << std::showpos << std::fixed << std::setprecision(6);
 }
 
 void TraceRow::begin(unsigned step)
 {
     itsText.str({});
-    itsText << std::noshowpos << std::setw(5) << step << std::showpos;
+    itsText << std::setw(5) << step;
 }
 
 void TraceRow::value(short aligned)
@@ -25,6 +26,19 @@ void TraceRow::values(const T8& column, unsigned first, unsigned last)
 {
     for (unsigned i = first; i <= last; ++i) {
         value(column[i]);
+    }
+}
+
+void TraceRow::compared(short aligned, short other)
+{
+    itsText << (aligned == other ? ' ' : '*');
+    value(aligned);
+}
+
+void TraceRow::compared(const T8& column, const T8& other, unsigned first, unsigned last)
+{
+    for (unsigned i = first; i <= last; ++i) {
+        compared(column[i], other[i]);
     }
 }
 

@@ -21,6 +21,12 @@ public:
     /// Elements first to last of a column.
     void values(const T8& column, unsigned first, unsigned last);
 
+    /// A value with a mark before it: "*" when `other`, which it is compared with, differs.
+    void compared(short aligned, short other);
+
+    /// Elements first to last of a column, each compared with the same element of another.
+    void compared(const T8& column, const T8& other, unsigned first, unsigned last);
+
     /// Two blanks between groups of values.
     void gap();
 

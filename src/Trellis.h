@@ -1,8 +1,8 @@
 // Trellis: the constituent code of 3GPP TS 36.212, clause 5.1.3.2.1, and the steps over it.
 //
 // Everything here is written once, over a value type: a 16-bit word in the kernels of the engine,
-// or a vector of such words; a value type offers addWrap, subWrap and maxWrap. How a decision is
-// made is a policy (TrellisDecision.h):
+// or a vector of such words; a value type offers addWrap, subWrap, maxWrap and select. How a decision
+// is made is a policy (TrellisDecision.h):
 //   Metric               what a decision yields and the next one takes
 //   metric(value)        a metric from a plain value, nothing pending
 //   add, subtract        a metric plus or minus a plain value
@@ -64,7 +64,8 @@ constexpr BranchMetrics<Wide> branchSums(Wide intrinsic, Wide parity0, Wide pari
     return {i2 + parity0 + parity1, i2 - parity0 + parity1, i2 - parity0 - parity1, i2 + parity0 - parity1};
 }
 
-/// Forward: the column after a step, each state decided between its two predecessors (rule 6).
+/// Forward: the column after a step, each state decided between its two predecessors, the one on bit 1
+/// first (rule 6).
 template <class Decision, class Value>
 constexpr Column<Decision> forwardStep(const Decision& rule, const Column<Decision>& a, const BranchMetrics<Value>& g)
 {
@@ -77,7 +78,8 @@ constexpr Column<Decision> forwardStep(const Decision& rule, const Column<Decisi
     return next;
 }
 
-/// Backward: the column before a step, each state decided between its two successors (rule 6).
+/// Backward: the column before a step, each state decided between its two successors, the one on bit 1
+/// first (rule 6).
 template <class Decision, class Value>
 constexpr Column<Decision> backwardStep(const Decision& rule, const Column<Decision>& b, const BranchMetrics<Value>& g)
 {
@@ -91,7 +93,8 @@ constexpr Column<Decision> backwardStep(const Decision& rule, const Column<Decis
 }
 
 /// The best metric of all branches with `bit`, as a tree of decisions: the two states of a pair
-/// share a branch metric, so they are decided first, then pairs, then halves (rule 8).
+/// share a branch metric, so they are decided first, the odd one being the first candidate, then
+/// pairs, then halves (rule 8).
 template <class Decision, class Value>
 constexpr Value bestPath(const Decision& rule,
                          unsigned bit,

@@ -1,7 +1,8 @@
 // TrellisDecision: the three ways to decide between two candidates at a trellis state (rule 7).
 //
-// The first candidate is the one that the branch for bit 1 reaches. A table is anything that can be
-// called with a decision difference and returns its correction, aligned like the metrics.
+// Which candidate is the first matters for ties and for the table's index; the steps in Trellis.h say
+// which it is. A table is anything that can be called with a decision difference and returns its
+// correction, aligned like the metrics.
 #ifndef MORVIK_TRELLISDECISION_H
 #define MORVIK_TRELLISDECISION_H
 
@@ -11,6 +12,7 @@ namespace trellis {
 
 using arithmetic::addWrap;
 using arithmetic::maxWrap;
+using arithmetic::select;
 using arithmetic::subWrap;
 
 /// Decisions that leave nothing pending: a metric is a plain value.
@@ -102,8 +104,9 @@ struct DecideMaxHash {
     constexpr Metric decide(Metric c1, Metric c2) const
     {
         const Value difference = subWrap(c1.value, c2.value);
-        const Metric winner = difference < 0 ? c2 : c1;
-        return {addWrap(winner.value, winner.pending), table(difference)};
+        const Value winner = select(difference, c1.value, c2.value);
+        const Value pending = select(difference, c1.pending, c2.pending);
+        return {addWrap(winner, pending), table(difference)};
     }
 
     static constexpr Value stored(Metric m)

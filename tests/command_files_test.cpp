@@ -185,6 +185,35 @@ TEST_F(CommandFiles, KeepsTheBlocksBeforeAMistake)
         withLine(text, 133, "2,x,1,1"), "in.csv:133: rsc1_sys \"x\"" + allowedValues, zeroDecision + zeroDecision);
 }
 
+TEST_F(CommandFiles, KeepsAWholeBlockWhateverIsWrongWithTheRowBehindIt)
+{
+    const std::string block = header + "\n" + zeroRows("0", 44);
+    for (const std::string row : {"x,1,1,1\n", "-1,1,1,1\n", ",1,1,1\n", "\n0,1,1,1\n", "1,1,1\n"}) {
+        const CommandResult result = decode(block + row);
+        EXPECT_EQ(result.status, 2) << row;
+        EXPECT_EQ(result.out, zeroDecision) << row;
+        EXPECT_EQ(result.err.rfind("morvik decode: in.csv:46: ", 0), 0U) << result.err;
+    }
+    const CommandResult endless = decode(block + std::string(9000, '1'));
+    EXPECT_EQ(endless.status, 2);
+    EXPECT_EQ(endless.out, zeroDecision);
+}
+
+TEST_F(CommandFiles, TellsTheMistakeThatCutABlockShort)
+{
+    const CommandResult result = decode(header + "\n" + zeroRows("0", 20) + "x,1,1,1\n" + zeroRows("0", 24));
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.out, "");
+    EXPECT_EQ(result.err.rfind("morvik decode: in.csv:22: ", 0), 0U) << result.err;
+}
+
+TEST_F(CommandFiles, RefusesAnEmptyNameOfAReference)
+{
+    const CommandResult result = decode(twoBlocks(), {"--reference", ""});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_NE(result.err.find("cannot be opened"), std::string::npos) << result.err;
+}
+
 TEST_F(CommandFiles, KeepsTheBlocksBeforeAMistakeInTheOutputFile)
 {
     const CommandResult result =

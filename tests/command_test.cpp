@@ -252,20 +252,24 @@ TEST_F(Command, DefaultsAreThoseOfTheCore)
     EXPECT_FALSE(defaults == trace("k2048.csv", {"--algorithm", "0"}));
 }
 
-TEST_F(Command, TagsCountUpFromTheFirst)
+TEST_F(Command, TagsCountUpWithinTheirWidth)
 {
-    const std::string truncated =
-        "WARNING:decoder:Input block tag has been truncated to 4 bits, further truncation will not be reported\n";
-    const std::string three = twoBlocks() + zeroRows("2", 44);
-    const auto warnings = [&](const std::string& text, const std::string& tag) {
-        const CommandResult result = decode(text, {"--tag-width", "4", "--tag", tag, "--output", "decided.bits"});
+    const auto truncated = [](const std::string& width) {
+        return "WARNING:decoder:Input block tag has been truncated to " + width +
+               " bits, further truncation will not be reported\n";
+    };
+    const auto warnings = [&](const std::string& width, const std::string& tag) {
+        const CommandResult result =
+            decode(twoBlocks() + zeroRows("2", 44), {"--tag-width", width, "--tag", tag, "--output", "decided.bits"});
         EXPECT_EQ(result.status, 0);
         return result.out;
     };
-    EXPECT_EQ(warnings(three, "13"), "") << "13, 14, 15";
-    EXPECT_EQ(warnings(three, "14"), truncated) << "14, 15, 16";
-    EXPECT_EQ(warnings(twoBlocks(), "14"), "") << "14, 15";
-    EXPECT_EQ(warnings(three, "4294967295"), truncated) << "and on with 0";
+    EXPECT_EQ(warnings("4", "14"), "") << "14, 15, 0";
+    EXPECT_EQ(warnings("4", "16"), truncated("4")) << "the user's own tag is too wide";
+    EXPECT_EQ(warnings("4", "4294967295"), truncated("4"));
+    EXPECT_EQ(warnings("0", "0"), "");
+    EXPECT_EQ(warnings("32", "0"), "");
+    EXPECT_EQ(warnings("32", "1"), truncated("32"));
 }
 
 TEST_F(Command, RefusesOptionValuesThatAreNotAllowed)

@@ -1,6 +1,6 @@
 // CommandRunner: runs a program as a user's shell would, and keeps what it printed.
-#ifndef MORVIK_TESTS_COMMAND_RUNNER_H
-#define MORVIK_TESTS_COMMAND_RUNNER_H
+#ifndef MORVIK_TESTS_COMMANDRUNNER_H
+#define MORVIK_TESTS_COMMANDRUNNER_H
 
 #include <sys/types.h>
 

@@ -1,6 +1,6 @@
 // CommandTest: what the tests of the command share.
-#ifndef MORVIK_TESTS_COMMAND_TEST_H
-#define MORVIK_TESTS_COMMAND_TEST_H
+#ifndef MORVIK_TESTS_COMMANDTEST_H
+#define MORVIK_TESTS_COMMANDTEST_H
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 // A second formulation of the whole LTE decoder, window by window from the flow of the border metrics: for checking.
-#ifndef MORVIK_TESTS_SUPPORT_PLAIN_DECODER_H
-#define MORVIK_TESTS_SUPPORT_PLAIN_DECODER_H
+#ifndef MORVIK_TESTS_PLAINDECODER_H
+#define MORVIK_TESTS_PLAINDECODER_H
 
 #include <optional>
 #include <vector>

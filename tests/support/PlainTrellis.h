@@ -1,6 +1,6 @@
 // The constituent code's trellis and kernels, computed plainly from the encoder's shift register: for checking.
-#ifndef MORVIK_TESTS_SUPPORT_PLAIN_TRELLIS_H
-#define MORVIK_TESTS_SUPPORT_PLAIN_TRELLIS_H
+#ifndef MORVIK_TESTS_PLAINTRELLIS_H
+#define MORVIK_TESTS_PLAINTRELLIS_H
 
 #include <array>
 #include <cstddef>

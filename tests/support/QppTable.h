@@ -1,6 +1,6 @@
 // The 188 block sizes of the LTE turbo code and the coefficients of their permutation polynomials.
-#ifndef MORVIK_TESTS_SUPPORT_QPP_TABLE_H
-#define MORVIK_TESTS_SUPPORT_QPP_TABLE_H
+#ifndef MORVIK_TESTS_QPPTABLE_H
+#define MORVIK_TESTS_QPPTABLE_H
 
 #include <array>
 

@@ -1,0 +1,268 @@
+// Allocation failure: every single allocation of creating a state and of decoding a block fails in
+// turn. Nothing crashes or leaks, the documented message or exception comes, the state still works.
+//
+// The program is linked from the model's objects, with their malloc and free wrapped by the linker.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <iostream>
+#include <new>
+#include <streambuf>
+#include <string_view>
+#include <vector>
+
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+extern "C" {
+void* __real_malloc(std::size_t size);
+void __real_free(void* memory);
+void* __wrap_malloc(std::size_t size);
+void __wrap_free(void* memory);
+}
+
+namespace {
+
+unsigned untilFailure = 0;  // 0: none is to fail
+long liveBlocks = 0;
+
+void* take(std::size_t size)
+{
+    if (untilFailure > 0 && --untilFailure == 0) {
+        return nullptr;
+    }
+    void* const memory = __real_malloc(size > 0 ? size : 1);
+    liveBlocks += memory != nullptr ? 1 : 0;
+    return memory;
+}
+
+void give(void* memory)
+{
+    liveBlocks -= memory != nullptr ? 1 : 0;
+    __real_free(memory);
+}
+
+}  // namespace
+
+void* __wrap_malloc(std::size_t size)
+{
+    return take(size);
+}
+
+void __wrap_free(void* memory)
+{
+    give(memory);
+}
+
+void* operator new(std::size_t size)
+{
+    void* const memory = take(size);
+    if (memory == nullptr) {
+        throw std::bad_alloc();
+    }
+    return memory;
+}
+
+void operator delete(void* memory) noexcept
+{
+    give(memory);
+}
+
+void operator delete(void* memory, std::size_t) noexcept
+{
+    give(memory);
+}
+
+namespace {
+
+/// A stream buffer that needs no memory: it keeps the first characters and drops the rest.
+class FixedBuffer : public std::streambuf {
+public:
+    FixedBuffer()
+    {
+        setp(itsText, itsText + sizeof itsText);
+    }
+
+    std::string_view text() const
+    {
+        return {itsText, static_cast<std::size_t>(pptr() - pbase())};
+    }
+
+private:
+    int overflow(int c) override
+    {
+        return c;
+    }
+
+    char itsText[4096];
+};
+
+/// Collects the library's lines, and makes an allocation fail, while it lives.
+class FailingAllocation {
+public:
+    explicit FailingAllocation(unsigned which)
+        : itsCout(std::cout.rdbuf(&itsOut)), itsCerr(std::cerr.rdbuf(&itsErr)), itsLiveBlocks(liveBlocks)
+    {
+        untilFailure = which;
+    }
+
+    ~FailingAllocation()
+    {
+        untilFailure = 0;
+        std::cout.rdbuf(itsCout);
+        std::cerr.rdbuf(itsCerr);
+    }
+
+    FailingAllocation(const FailingAllocation&) = delete;
+    FailingAllocation& operator=(const FailingAllocation&) = delete;
+
+    /// Whether the call needed so many allocations at all.
+    static bool happened()
+    {
+        return untilFailure == 0;
+    }
+
+    std::string_view errors() const
+    {
+        return itsErr.text();
+    }
+
+    long leaked() const
+    {
+        return liveBlocks - itsLiveBlocks;
+    }
+
+private:
+    FixedBuffer itsOut;
+    FixedBuffer itsErr;
+    std::streambuf* itsCout;
+    std::streambuf* itsCerr;
+    long itsLiveBlocks;
+};
+
+constexpr unsigned manyAllocations = 100000;  // more than any call needs, less than for ever
+
+veltra_ip_morvik_v1_0_generics genericsOf(int algorithm)
+{
+    veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
+    generics.C_ALGORITHM_TYPE = algorithm;
+    return generics;
+}
+
+struct Block {
+    std::vector<std::int32_t> stream;
+    std::vector<std::uint8_t> bits;
+    veltra_ip_morvik_v1_0_outputs outputs{};
+
+    explicit Block(unsigned K) : stream(K + 4), bits(K)
+    {
+        unsigned seed = K;
+        for (std::int32_t& value : stream) {
+            seed = seed * 1664525U + 1013904223U;
+            value = static_cast<std::int32_t>(seed) >> 24;
+        }
+    }
+
+    std::int32_t decode(veltra_ip_morvik_v1_0_state* state)
+    {
+        outputs = {bits.data(), static_cast<std::uint32_t>(bits.size()), 777, 777};
+        return veltra_ip_morvik_v1_0_bitacc_simulate(state,
+                                                     stream.data(),
+                                                     stream.data(),
+                                                     stream.data(),
+                                                     static_cast<std::int32_t>(stream.size()),
+                                                     2,
+                                                     1,
+                                                     &outputs);
+    }
+};
+
+}  // namespace
+
+TEST(AllocationFailure, OfAStateLeavesNothingBehind)
+{
+    for (const int algorithm : {0, 1, 2}) {
+        unsigned failures = 0;
+        for (unsigned which = 1; which < manyAllocations; ++which) {
+            const FailingAllocation failing(which);
+            veltra_ip_morvik_v1_0_state* const state = veltra_ip_morvik_v1_0_create_state(genericsOf(algorithm));
+            if (!FailingAllocation::happened()) {
+                EXPECT_NE(state, nullptr);
+                veltra_ip_morvik_v1_0_destroy_state(state);
+                EXPECT_EQ(failing.leaked(), 0);
+                break;
+            }
+            ++failures;
+            EXPECT_EQ(state, nullptr);
+            EXPECT_EQ(failing.leaked(), 0);
+            EXPECT_EQ(failing.errors(),
+                      which == 1 ? "ERROR:decoder:Could not allocate memory for decoder state\n"
+                                 : "ERROR:decoder:Unhandled exception has occurred\n");
+        }
+        EXPECT_GE(failures, 7U);  // the record and six components
+    }
+}
+
+TEST(AllocationFailure, OfAnEmptyRecordIsReported)
+{
+    const FailingAllocation failing(1);
+    EXPECT_EQ(create_default_state(genericsOf(0)), nullptr);
+    EXPECT_EQ(failing.errors(), "ERROR:decoder:Could not allocate memory for decoder state\n");
+    EXPECT_EQ(failing.leaked(), 0);
+}
+
+/// Decodes a block in a state that has decoded another one before, with a failing allocation, then
+/// without. Whether there are further allocations to fail.
+bool decodeWithFailure(
+    unsigned which, unsigned traced, Block& before, Block& block, const std::vector<std::uint8_t>& expected)
+{
+    veltra_ip_morvik_v1_0_state* const state = veltra_ip_morvik_v1_0_create_state(genericsOf(1));
+    EXPECT_EQ(before.decode(state), 0);
+    bool happened = false;
+    {
+        veltra_ip_morvik_v1_0_bitacc_dump_config(state, traced);
+        const FailingAllocation failing(which);
+        std::int32_t status = -1;
+        try {
+            status = block.decode(state);
+        } catch (const std::bad_alloc&) {
+            EXPECT_EQ(failing.errors(), "");  // the soft values' buffer, before the decoder is called
+            status = 99;
+        }
+        happened = FailingAllocation::happened();
+        EXPECT_EQ(status, happened ? 99 : 0) << which;
+        if (happened) {
+            EXPECT_EQ(block.outputs.dout_size, 777U);
+            EXPECT_EQ(block.outputs.tag, 777U);
+            EXPECT_TRUE(failing.errors().empty() ||
+                        failing.errors() == "ERROR:decoder:Unhandled exception has occurred\n");
+        }
+    }
+    veltra_ip_morvik_v1_0_bitacc_dump_config(state, 0);
+    EXPECT_EQ(block.decode(state), 0);
+    EXPECT_EQ(block.bits, expected);
+    veltra_ip_morvik_v1_0_destroy_state(state);
+    return happened;
+}
+
+TEST(AllocationFailure, OfADecodeLeavesAWorkingState)
+{
+    for (const auto& [previous, K] :
+         std::vector<std::pair<unsigned, unsigned>>{{40, 512}, {512, 40}, {512, 512}, {640, 1024}}) {
+        for (const unsigned traced : {0U, 1U}) {
+            Block before(previous);
+            Block block(K);
+            veltra_ip_morvik_v1_0_state* const state = veltra_ip_morvik_v1_0_create_state(genericsOf(1));
+            EXPECT_EQ(block.decode(state), 0);
+            veltra_ip_morvik_v1_0_destroy_state(state);
+            const std::vector<std::uint8_t> expected = block.bits;
+
+            const long live = liveBlocks;
+            unsigned which = 1;
+            while (which < manyAllocations && decodeWithFailure(which, traced, before, block, expected)) {
+                which += which < 100 ? 1 : 37;  // a trace allocates alike for each of its rows
+            }
+            EXPECT_GE(which, 3U);
+            EXPECT_EQ(liveBlocks, live);
+        }
+    }
+}

@@ -1,0 +1,98 @@
+// FuzzInput: takes numbers and texts off the bytes that a fuzzer gives.
+#ifndef MORVIK_TESTS_FUZZINPUT_H
+#define MORVIK_TESTS_FUZZINPUT_H
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdlib>
+#include <iostream>
+#include <streambuf>
+#include <string>
+
+/// Reads zeros when the bytes are used up.
+class FuzzInput {
+public:
+    FuzzInput(const std::uint8_t* data, std::size_t size) : itsNext(data), itsEnd(data + size) {}
+
+    bool empty() const
+    {
+        return itsNext == itsEnd;
+    }
+
+    std::uint8_t byte()
+    {
+        return empty() ? std::uint8_t{0} : *itsNext++;
+    }
+
+    /// A number below `count`, from one byte.
+    unsigned below(unsigned count)
+    {
+        return byte() % count;
+    }
+
+    std::uint32_t word()
+    {
+        std::uint32_t value = 0;
+        for (unsigned i = 0; i < 4; ++i) {
+            value = value << 8 | byte();
+        }
+        return value;
+    }
+
+    std::int32_t integer()
+    {
+        return static_cast<std::int32_t>(word());
+    }
+
+    /// All that is left.
+    std::string text()
+    {
+        std::string rest(itsNext, itsEnd);
+        itsNext = itsEnd;
+        return rest;
+    }
+
+private:
+    const std::uint8_t* itsNext;
+    const std::uint8_t* itsEnd;
+};
+
+/// Keeps the library's lines from the terminal while it lives.
+class SilencedStreams {
+public:
+    SilencedStreams() : itsCout(std::cout.rdbuf(&itsNowhere)), itsCerr(std::cerr.rdbuf(&itsNowhere)) {}
+
+    ~SilencedStreams()
+    {
+        std::cout.rdbuf(itsCout);
+        std::cerr.rdbuf(itsCerr);
+    }
+
+    SilencedStreams(const SilencedStreams&) = delete;
+    SilencedStreams& operator=(const SilencedStreams&) = delete;
+
+private:
+    struct Nowhere : std::streambuf {
+        int overflow(int c) override
+        {
+            return c;
+        }
+    };
+
+    Nowhere itsNowhere;
+    std::streambuf* itsCout;
+    std::streambuf* itsCerr;
+};
+
+/// Ends the program, which a fuzzer reports with the input, when a promise is broken.
+inline void require(bool kept, const char* promise)
+{
+    if (!kept) {
+        std::cerr << "broken: " << promise << std::endl;
+        std::abort();
+    }
+}
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size);
+
+#endif

@@ -1,0 +1,39 @@
+// Threads: two states used by two threads at the same time give what they give alone.
+#include <gtest/gtest.h>
+
+#include <thread>
+#include <vector>
+
+#include "support/Blocks.h"
+
+namespace {
+
+/// The decisions of blocks of changing sizes, decoded in one state.
+std::vector<std::vector<std::uint8_t>> decodeMany(int units, int algorithm)
+{
+    blocks::Random random(static_cast<unsigned>(10 * units + algorithm));
+    blocks::Decoder decoder(units, algorithm);
+    std::vector<std::vector<std::uint8_t>> decisions;
+    for (unsigned i = 0; i < 30; ++i) {
+        const auto K = static_cast<unsigned>(40 + 8 * blocks::between(random, 0, 59));
+        const blocks::Block block = blocks::randomBlock(random, K, blocks::Values::uniform);
+        decisions.push_back(decoder.decode(block, 3).bits);
+    }
+    return decisions;
+}
+
+}  // namespace
+
+TEST(Threads, WithAStateEachDecodeAsIfAlone)
+{
+    const auto firstAlone = decodeMany(2, 1);
+    const auto secondAlone = decodeMany(8, 2);
+    std::vector<std::vector<std::uint8_t>> first;
+    std::vector<std::vector<std::uint8_t>> second;
+    std::thread one([&first] { first = decodeMany(2, 1); });
+    std::thread two([&second] { second = decodeMany(8, 2); });
+    one.join();
+    two.join();
+    EXPECT_EQ(first, firstAlone);
+    EXPECT_EQ(second, secondAlone);
+}
