@@ -1,0 +1,110 @@
+#!/usr/bin/env bash
+# Runs at a desk what continuous integration runs: all stages, or the named ones.
+#   ci.sh [STAGE...]
+# Stages: format lint compilers abi memory threads fuzz coverage tests
+set -euo pipefail
+cd "$(dirname "$0")/.."
+
+sources() {
+    git ls-files '*.h' '*.cpp' '*.c'
+}
+
+stage_format() {
+    sources | xargs clang-format --dry-run -Werror
+}
+
+stage_lint() {
+    scripts/build x86_64
+    git ls-files 'src/*.cpp' 'app/*.cpp' | xargs -P "$(nproc)" -n 1 clang-tidy -p build/x86_64 --quiet 2>/dev/null
+    cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
+        --suppress=internalAstError -I include -I src src app
+}
+
+# Both compilers, all warnings as errors; g++ is in the stage of the tests.
+stage_compilers() {
+    scripts/build clang
+    ctest --preset clang --parallel "$(nproc)"
+}
+
+# The binary interface against the committed one, which is kept compressed.
+stage_abi() {
+    local bits
+    for bits in 64 32; do
+        scripts/build abi-$bits morvik_v1_0_bitacc_cmodel
+        xz --decompress --stdout "tests/data/abi.$bits.xml.xz" >"build/abi-$bits.xml"
+        abidiff "build/abi-$bits.xml" "$(library_of $bits)"
+    done
+}
+
+# Makes the interface as it is now the committed one, after an intended change.
+stage_abi-renew() {
+    local bits
+    for bits in 64 32; do
+        scripts/build abi-$bits morvik_v1_0_bitacc_cmodel
+        abidw --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
+            --headers-dir include --headers-dir src "$(library_of $bits)" |
+            xz -9 >"tests/data/abi.$bits.xml.xz"
+    done
+}
+
+library_of() {
+    echo "build/abi-$1/lib/libmorvik_v1_0_bitacc_cmodel.so"
+}
+
+# Address and undefined behaviour sanitizers on all tests; then valgrind, which sees reads of memory
+# that was never written, on those that decode.
+stage_memory() {
+    scripts/build sanitize
+    ctest --preset sanitize --parallel "$(nproc)"
+    scripts/build x86_64
+    local test
+    for test in exact_blocks_test random_blocks_test morvik_v1_0_bitacc_cmodel_test TDecoder3G_test TDecoder3GPU_test; do
+        MORVIK_TEST_BLOCKS=5 valgrind --quiet --error-exitcode=99 --leak-check=full \
+            "build/x86_64/tests/$test" --gtest_brief=1
+    done
+}
+
+stage_threads() {
+    scripts/build threads threads_test
+    build/threads/tests/threads_test --gtest_brief=1
+}
+
+# Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead.
+stage_fuzz() {
+    scripts/build fuzz
+    local fuzzer work
+    work=$(mktemp -d)
+    trap 'rm -rf "$work"' RETURN
+    for fuzzer in csv_fuzz property_strings_fuzz simulate_fuzz state_fuzz text_fuzz; do
+        local limit=(-runs=2000)
+        [ -z "${FUZZ_SECONDS:-}" ] || limit=(-max_total_time="$FUZZ_SECONDS")
+        mkdir "$work/$fuzzer"
+        "build/fuzz/tests/$fuzzer" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/fuzz/" \
+            "$work/$fuzzer" "tests/fuzz/corpus/$fuzzer" >"$work/log" 2>&1 || { tail -n 60 "$work/log"; return 1; }
+        echo "$fuzzer: $(sed -n 's/.*number_of_executed_units: *//p' "$work/log") executions"
+    done
+}
+
+stage_coverage() {
+    scripts/build coverage
+    find build/coverage -name '*.gcda' -delete
+    ctest --preset coverage --parallel "$(nproc)" >build/coverage/tests.log || { cat build/coverage/tests.log; return 1; }
+    gcovr --root . --filter src/ --exclude-throw-branches --exclude-unreachable-branches \
+        --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
+    echo "Details: build/coverage/report.html"
+}
+
+stage_tests() {
+    ./test
+}
+
+scripts/setup --checks
+[ $# -gt 0 ] || set -- format lint compilers abi memory threads fuzz coverage tests
+for stage in "$@"; do
+    if ! declare -F "stage_$stage" >/dev/null; then
+        echo "ci.sh: no stage '$stage'; stages are format lint compilers abi abi-renew memory threads fuzz coverage tests" >&2
+        exit 2
+    fi
+    echo "== $stage"
+    "stage_$stage"
+done
