@@ -23,7 +23,7 @@ stage_lint() {
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.
 stage_compilers() {
     scripts/build clang
-    ctest --preset clang --parallel "$(nproc)"
+    scripts/run-tests clang
 }
 
 # The binary interface against the committed one, which is kept compressed.
@@ -55,7 +55,7 @@ library_of() {
 # that was never written, on those that decode.
 stage_memory() {
     scripts/build sanitize
-    ctest --preset sanitize --parallel "$(nproc)"
+    scripts/run-tests sanitize
     scripts/build x86_64
     local test
     for test in exact_blocks_test random_blocks_test morvik_v1_0_bitacc_cmodel_test TDecoder3G_test TDecoder3GPU_test; do
@@ -88,7 +88,7 @@ stage_fuzz() {
 stage_coverage() {
     scripts/build coverage
     find build/coverage -name '*.gcda' -delete
-    ctest --preset coverage --parallel "$(nproc)" >build/coverage/tests.log || { cat build/coverage/tests.log; return 1; }
+    scripts/run-tests coverage
     gcovr --root . --filter src/ --exclude-throw-branches --exclude-unreachable-branches \
         --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
     echo "Details: build/coverage/report.html"

@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
-#include <cstddef>
 #include <istream>
 #include <ostream>
 
@@ -113,10 +112,22 @@ unsigned char lutEntry(std::int32_t difference, std::uint32_t ignored, long doub
     return static_cast<unsigned char>(format.place(correction) & 0xFF);
 }
 
-std::nullptr_t refuseType(const char* kernel)
+/// Runs the variant of a kernel, "MOD", "MOD*" or "MOD#", that the engine's algorithm type asks for.
+template <class Result, class... Arguments>
+Result* runVariant(const TCalculationEngineModBase& engine,
+                   TCalculationEngineModBase::AlgorithmType type,
+                   const char* kernel,
+                   Result* (TCalculationEngineModBase::*const (&variants)[3])(Arguments...) const,
+                   Arguments... arguments)
 {
-    messages::writeError("ERROR:TCalculationEngineModBase::", kernel, ":Illegal algorithm type");
-    return nullptr;
+    if (engine.itsUseSSE2) {
+        return nullptr;
+    }
+    if (type < TCalculationEngineModBase::MOD || type > TCalculationEngineModBase::MOD_HASH) {
+        messages::writeError("ERROR:TCalculationEngineModBase::", kernel, ":Illegal algorithm type");
+        return nullptr;
+    }
+    return (engine.*variants[type - TCalculationEngineModBase::MOD])(arguments...);
 }
 
 }  // namespace
@@ -129,56 +140,40 @@ T8* TCalculationEngineModBase::gamma(
 
 T8* TCalculationEngineModBase::alpha(unsigned n, const T8* g, T8* a)
 {
-    if (itsUseSSE2) {
-        return nullptr;
-    }
-    switch (itsAlphaAlgorithmType) {
-    case MOD:
-        return mod_alpha(n, g, a);
-    case MOD_STAR:
-        return modstar_alpha(n, g, a);
-    case MOD_HASH:
-        return modhash_alpha(n, g, a);
-    case UNKNOWN:
-        break;
-    }
-    return refuseType("alpha");
+    using Engine = TCalculationEngineModBase;
+    return runVariant(*this,
+                      itsAlphaAlgorithmType,
+                      "alpha",
+                      {&Engine::mod_alpha, &Engine::modstar_alpha, &Engine::modhash_alpha},
+                      n,
+                      g,
+                      a);
 }
 
 T8* TCalculationEngineModBase::beta(unsigned n, const T8* g, T8* b)
 {
-    if (itsUseSSE2) {
-        return nullptr;
-    }
-    switch (itsBetaAlgorithmType) {
-    case MOD:
-        return mod_beta(n, g, b);
-    case MOD_STAR:
-        return modstar_beta(n, g, b);
-    case MOD_HASH:
-        return modhash_beta(n, g, b);
-    case UNKNOWN:
-        break;
-    }
-    return refuseType("beta");
+    using Engine = TCalculationEngineModBase;
+    return runVariant(*this,
+                      itsBetaAlgorithmType,
+                      "beta",
+                      {&Engine::mod_beta, &Engine::modstar_beta, &Engine::modhash_beta},
+                      n,
+                      g,
+                      b);
 }
 
 short* TCalculationEngineModBase::llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out)
 {
-    if (itsUseSSE2) {
-        return nullptr;
-    }
-    switch (itsLLRAlgorithmType) {
-    case MOD:
-        return mod_llr(n, a, b, g, out);
-    case MOD_STAR:
-        return modstar_llr(n, a, b, g, out);
-    case MOD_HASH:
-        return modhash_llr(n, a, b, g, out);
-    case UNKNOWN:
-        break;
-    }
-    return refuseType("llr");
+    using Engine = TCalculationEngineModBase;
+    return runVariant(*this,
+                      itsLLRAlgorithmType,
+                      "llr",
+                      {&Engine::mod_llr, &Engine::modstar_llr, &Engine::modhash_llr},
+                      n,
+                      a,
+                      b,
+                      g,
+                      out);
 }
 
 T8* TCalculationEngineModBase::mod_gamma(

@@ -181,15 +181,16 @@ bool TDecoder3G::interleaveSystematic(unsigned K)
 
 bool TDecoder3G::preparePermutation(unsigned d, unsigned K) const
 {
-    std::vector<unsigned>& table = permutation(d);
-    if (K != 0 && table.size() != K) {
-        if (d == 1) {
-            itsInterleaver->calcInterleaver(table, K);
-        } else {
-            itsInterleaver->calcDeinterleaver(table, K);
-        }
+    if (K == 0) {
+        return true;  // a block of no bits needs none
     }
-    return K == 0 || table.size() == K;
+    std::vector<unsigned>& table = permutation(d);
+    if (table.size() != K && d == 1) {
+        itsInterleaver->calcInterleaver(table, K);
+    } else if (table.size() != K) {
+        itsInterleaver->calcDeinterleaver(table, K);
+    }
+    return table.size() == K;
 }
 
 std::vector<unsigned>& TDecoder3G::permutation(unsigned d) const

@@ -73,7 +73,8 @@ constexpr Column<Decision> forwardStep(const Decision& rule, const Column<Decisi
     for (unsigned state = 0; state < stateCount; ++state) {
         const unsigned one = predecessor(state, 1);
         const unsigned zero = predecessor(state, 0);
-        next[state] = rule.decide(rule.add(a[one], g[branch(one)]), rule.subtract(a[zero], g[branch(zero)]));
+        const Value metric = g[branch(one)];  // the two are a pair
+        next[state] = rule.decide(rule.add(a[one], metric), rule.subtract(a[zero], metric));
     }
     return next;
 }

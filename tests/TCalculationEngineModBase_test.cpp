@@ -345,6 +345,18 @@ TEST(TCalculationEngineModBase, BuildsTablesOfEveryPowerOfTwoLikeThePlainFormula
     }
 }
 
+TEST(TCalculationEngineModBase, BuildsTheTableOfAFormatThatFillsTheWord)
+{
+    // Fix_16_3 with 16 points resolves half a unit, four steps: 8 ln(1 + e^-r) at r = 0, 1/2, 1.
+    const std::vector<unsigned char> lut = Base::createLUT(16, TNumberFormat(16, 3));
+    ASSERT_EQ(lut.size(), 65536U);
+    const unsigned char expected[12] = {6, 6, 6, 6, 4, 4, 4, 4, 3, 3, 3, 3};
+    for (unsigned d = 0; d < 12; ++d) {
+        EXPECT_EQ(lut[32768 + d], expected[d]) << d;
+        EXPECT_EQ(lut[32767 - d], expected[d]) << "-" << d + 1;
+    }
+}
+
 TEST(TCalculationEngineModBase, RefusesTablesThatCannotBeBuilt)
 {
     const std::string number = "ERROR:TCalculationEngineModBase::createLUT:Number of points must be a binary number\n";

@@ -306,6 +306,9 @@ TEST(TDecoder3GPU, LeavesTheMetricsOfTheTailAlone)
         EXPECT_TRUE(compareT8(decoder.itsGamma[k], T8{})) << k;
         EXPECT_TRUE(compareT8(decoder.itsBeta[k], T8{})) << k;
     }
+    EXPECT_FALSE(compareT8(decoder.itsAlpha[40], T8{}));  // where the last segment ends
+    EXPECT_TRUE(compareT8(decoder.itsAlpha[41], T8{}));
+    EXPECT_TRUE(compareT8(decoder.itsAlpha[42], T8{}));
 }
 
 TEST(TDecoder3GPU, StartsTheLastWindowFromThePathsThatEmptyTheEncoder)
@@ -357,6 +360,19 @@ TEST(TDecoder3GPU, ClearsTheBorderColumnsForEveryBlock)
     }
 }
 
+TEST(TDecoder3GPU, StartsAgainFromUnknownStatesInTheFirstPasses)
+{
+    blocks::Random random(12);
+    Units decoder(2);
+    ASSERT_TRUE(decoder.extract(drawSoft(random, 512)));
+    ASSERT_TRUE(decoder.calcSISO(0) && decoder.calcSISO(1));
+    const Soft first = decoder.itsLLR;
+    ASSERT_TRUE(decoder.calcSISO(2) && decoder.calcSISO(3));
+    EXPECT_NE(decoder.itsLLR, first);
+    ASSERT_TRUE(decoder.calcSISO(0) && decoder.calcSISO(1));
+    EXPECT_EQ(decoder.itsLLR, first);
+}
+
 TEST(TDecoder3GPU, DecodesEachBlockAsIfItWereTheFirst)
 {
     blocks::Random random(10);
@@ -384,6 +400,7 @@ TEST(TDecoder3GPU, DecodesABlockOfNoBitsToNothing)
         const CapturedStreams streams;
         EXPECT_TRUE(decoder.decode(Soft(12, 256), hard, 1));
         EXPECT_TRUE(hard.empty());
+        EXPECT_EQ(decoder.itsInterleaver->itsPi.size(), before);  // left as it was
         const std::string trace = streams.out();
         EXPECT_EQ(std::count(trace.begin(), trace.end(), '\n'), 7 + 3 + 3);  // input, header, three tail rows
         EXPECT_EQ(streams.err(), "");

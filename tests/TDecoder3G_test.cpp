@@ -384,6 +384,18 @@ TEST(TDecoder3G, RunsPassesOverTheWholeTrellisInterleavedOrderFirst)
     }
 }
 
+TEST(TDecoder3G, WritesNoColumnBeyondTheTrellis)
+{
+    SingleEngine decoder;
+    std::vector<unsigned char> hard;
+    ASSERT_TRUE(decoder.decode(numbered(3 * 40 + 12), hard, 1));
+    for (unsigned k = 43; k < 64; ++k) {  // there is storage for 64
+        EXPECT_TRUE(compareT8(decoder.itsAlpha[k], T8{})) << k;
+        EXPECT_TRUE(compareT8(decoder.itsBeta[k], T8{})) << k;
+        EXPECT_TRUE(compareT8(decoder.itsGamma[k], T8{})) << k;
+    }
+}
+
 TEST(TDecoder3G, CountsErrorsIterationByIteration)
 {
     blocks::Random random(4);

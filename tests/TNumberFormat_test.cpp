@@ -149,3 +149,13 @@ TEST(TNumberFormat, ReadsWordsRoundingDownToTheFormatsBits)
         EXPECT_EQ(static_cast<double>(format.real(word)), real) << word;
     }
 }
+
+TEST(TNumberFormat, ReadsBackWhatItPlacesInEveryWidth)
+{
+    for (std::uint32_t bits = 2; bits <= 16; ++bits) {
+        const TNumberFormat format(bits, 1);
+        for (const std::int32_t q : {format.itsMinQ, format.itsMinQ + 1, -1, 0, 1, format.itsMaxQ}) {
+            EXPECT_EQ(format.integer(format.place(q)), q) << bits;
+        }
+    }
+}
