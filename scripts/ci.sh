@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # Runs at a desk what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
-# Stages: format lint compilers abi memory threads fuzz coverage tests
+# Stages: format lint compilers abi memory threads fuzz coverage tests, and only when they are named:
+# abi-renew mutate
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -71,11 +72,12 @@ stage_threads() {
 
 # Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead.
 stage_fuzz() {
-    scripts/build fuzz
+    local fuzzers=(csv_fuzz property_strings_fuzz simulate_fuzz state_fuzz text_fuzz)
+    scripts/build fuzz "${fuzzers[@]}"
     local fuzzer work
     work=$(mktemp -d)
     trap 'rm -rf "$work"' RETURN
-    for fuzzer in csv_fuzz property_strings_fuzz simulate_fuzz state_fuzz text_fuzz; do
+    for fuzzer in "${fuzzers[@]}"; do
         local limit=(-runs=2000)
         [ -z "${FUZZ_SECONDS:-}" ] || limit=(-max_total_time="$FUZZ_SECONDS")
         mkdir "$work/$fuzzer"
@@ -94,6 +96,11 @@ stage_coverage() {
     echo "Details: build/coverage/report.html"
 }
 
+# Not among the stages that run without being named: it takes most of an hour.
+stage_mutate() {
+    scripts/mutate
+}
+
 stage_tests() {
     ./test
 }
@@ -102,7 +109,7 @@ scripts/setup --checks
 [ $# -gt 0 ] || set -- format lint compilers abi memory threads fuzz coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint compilers abi abi-renew memory threads fuzz coverage tests" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint compilers abi memory threads fuzz coverage tests abi-renew mutate" >&2
         exit 2
     fi
     echo "== $stage"

@@ -74,7 +74,7 @@ private:
 
     std::ostream& itsStream;
     std::size_t itsSize = 0;
-    char itsText[1024];
+    char itsText[1024] = {};
 };
 
 /// Writes the parts one after the other as a line and flushes the stream.

@@ -186,6 +186,26 @@ TEST(TDecoder3G, RefusesSizesThatTheInterleaverDoesNotKnow)
     EXPECT_EQ(decoder.itsDumpCount, 1U);
 }
 
+TEST(TDecoder3G, RunsNoPassOnASizeThatTheInterleaverDoesNotKnow)
+{
+    SingleEngine decoder;
+    ASSERT_TRUE(decoder.allocate(44 + 3));
+    EXPECT_FALSE(decoder.calcIntrinsic(0));
+    EXPECT_FALSE(decoder.calcIntrinsic(1));
+}
+
+TEST(TDecoder3G, CountsNothingOfARefusedBlock)
+{
+    const CapturedStreams streams;
+    SingleEngine decoder;
+    Counts bitErrors(2);
+    Counts blockErrors(2);
+    EXPECT_FALSE(decoder.decode(Soft(131), Bits(40), bitErrors, blockErrors));
+    EXPECT_EQ(bitErrors, Counts(2));
+    EXPECT_EQ(blockErrors, Counts(2));
+    EXPECT_EQ(decoder.itsDecodeCount, 0U);
+}
+
 TEST(TDecoder3G, DecidesForOnesWithoutIterationsAndCountsDecodes)
 {
     SingleEngine decoder;

@@ -5,6 +5,8 @@
 
 #include <cstdint>
 #include <memory>
+#include <new>
+#include <sstream>
 
 #include "support/CapturedStreams.h"
 
@@ -111,6 +113,15 @@ TEST(TDecoder, GrowsTheMetricBufferBy64ColumnsAndNeverShrinksIt)
     }
 }
 
+TEST(TDecoder, RefusesABufferBeyond32Bits)
+{
+    FixedDecoder decoder;
+    decoder.allocate(40);
+    EXPECT_THROW(decoder.allocate(89478465), std::bad_alloc);  // 2^32 + 2064 bytes
+    EXPECT_TRUE(decoder.allocate(100));
+    EXPECT_EQ(decoder.itsMetricBufferSize, 6160U);
+}
+
 TEST(TDecoder, ZeroesSoftValuesAtEveryAllocationButColumnsAtNewOnesOnly)
 {
     FixedDecoder decoder;
@@ -182,6 +193,15 @@ TEST(TDecoder, ExtendsTheBlockErrorsToTheBitErrors)
     Counts blockErrors;
     EXPECT_TRUE(decoder.decode({}, {0}, bitErrors, blockErrors));
     EXPECT_EQ(blockErrors, (Counts{0, 1}));
+}
+
+TEST(TDecoder, DumpsNothingOfItsOwn)
+{
+    FixedDecoder decoder;
+    std::ostringstream os;
+    decoder.dump(os);
+    decoder.TDecoder::dumpFull(os, 0);
+    EXPECT_EQ(os.str(), "");
 }
 
 TEST(TDecoder, DumpsHalfIterationsWhileTheCountLasts)

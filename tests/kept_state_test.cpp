@@ -18,7 +18,7 @@ protected:
 
     unsigned anySize()
     {
-        return sizes[static_cast<std::size_t>(blocks::between(random, 0, 110))];
+        return sizes[static_cast<std::size_t>(blocks::between(random, 0, 187))];
     }
 
     blocks::Block anyBlock(unsigned K)
