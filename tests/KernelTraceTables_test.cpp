@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "TCalculationEngineModBase.h"
+#include "support/CommaLocale.h"
 
 namespace {
 
@@ -147,4 +148,14 @@ TEST(KernelTraceTables, DoNotDependOnTheStreamsFlags)
     odd.width(40);
     dumpGamma(odd, 3, values, values, values, columns, columns, stateFormat);
     EXPECT_EQ(odd.str(), plain.str());
+}
+
+TEST(KernelTraceTables, DoNotDependOnTheGlobalLocale)
+{
+    std::ostringstream plain;
+    dumpGamma(plain, 3, values, values, values, columns, columns, stateFormat);
+    const CommaLocale locale;
+    std::ostringstream foreign;
+    dumpGamma(foreign, 3, values, values, values, columns, columns, stateFormat);
+    EXPECT_EQ(foreign.str(), plain.str());
 }

@@ -3,10 +3,10 @@
 
 #include <cmath>
 #include <limits>
-#include <locale>
 #include <sstream>
 
 #include "Misc.h"
+#include "support/CommaLocale.h"
 
 namespace {
 
@@ -24,42 +24,6 @@ double justBelow(double value)
 {
     return std::nextafter(value, -kInfinity);
 }
-
-/// Number punctuation of a locale that writes 1.234,5.
-class CommaPunctuation : public std::numpunct<char> {
-protected:
-    char do_decimal_point() const override
-    {
-        return ',';
-    }
-
-    char do_thousands_sep() const override
-    {
-        return '.';
-    }
-
-    std::string do_grouping() const override
-    {
-        return "\3";
-    }
-};
-
-/// Makes CommaPunctuation the global locale's for the lifetime of the object.
-class CommaLocale {
-public:
-    CommaLocale() : itsPrevious(std::locale::global(std::locale(std::locale(), new CommaPunctuation))) {}
-
-    ~CommaLocale()
-    {
-        std::locale::global(itsPrevious);
-    }
-
-    CommaLocale(const CommaLocale&) = delete;
-    CommaLocale& operator=(const CommaLocale&) = delete;
-
-private:
-    std::locale itsPrevious;
-};
 
 // --- toSIString ----------------------------------------------------------------------------------
 

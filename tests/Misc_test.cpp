@@ -130,6 +130,7 @@ TEST(Parse, CutsAtTheFirstCommentMarkOfEitherKind)
     EXPECT_EQ(parsed("a = 1 # x // y"), (Parameters{{"a", "1"}}));
     EXPECT_EQ(parsed("a = 1 // x # y"), (Parameters{{"a", "1"}}));
     EXPECT_EQ(parsed("a = b//c//d"), (Parameters{{"a", "b"}}));
+    EXPECT_EQ(parsed("!a = 1"), (Parameters{{"!a", "1"}}));  // the first character above a blank
     EXPECT_EQ(parsed("a#=1"), (Parameters{{"a", ""}}));
     EXPECT_EQ(parsed("a = /1/"), (Parameters{{"a", "/1/"}}));
 }

@@ -15,7 +15,7 @@ std::vector<std::vector<std::uint8_t>> decodeMany(int units, int algorithm)
     blocks::Decoder decoder(units, algorithm);
     std::vector<std::vector<std::uint8_t>> decisions;
     for (unsigned i = 0; i < 30; ++i) {
-        const auto K = static_cast<unsigned>(40 + 8 * blocks::between(random, 0, 59));
+        const unsigned K = i == 0 ? 2048 : static_cast<unsigned>(40 + 8 * blocks::between(random, 0, 59));
         const blocks::Block block = blocks::randomBlock(random, K, blocks::Values::uniform);
         decisions.push_back(decoder.decode(block, 3).bits);
     }

@@ -13,6 +13,7 @@ namespace {
 void replay(const std::filesystem::path& path)
 {
     std::ifstream file(path, std::ios::binary);
+    require(file.is_open(), "an input to replay exists");
     const std::vector<char> bytes{std::istreambuf_iterator<char>(file), {}};
     LLVMFuzzerTestOneInput(reinterpret_cast<const std::uint8_t*>(bytes.data()), bytes.size());
 }

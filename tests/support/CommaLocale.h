@@ -1,0 +1,44 @@
+// CommaLocale: a global locale in which numbers are written differently.
+#ifndef MORVIK_TESTS_COMMALOCALE_H
+#define MORVIK_TESTS_COMMALOCALE_H
+
+#include <locale>
+#include <string>
+
+/// Number punctuation of a locale that writes 1.234,5.
+class CommaPunctuation : public std::numpunct<char> {
+protected:
+    char do_decimal_point() const override
+    {
+        return ',';
+    }
+
+    char do_thousands_sep() const override
+    {
+        return '.';
+    }
+
+    std::string do_grouping() const override
+    {
+        return "\3";
+    }
+};
+
+/// Makes CommaPunctuation the global locale's for the lifetime of the object.
+class CommaLocale {
+public:
+    CommaLocale() : itsPrevious(std::locale::global(std::locale(std::locale(), new CommaPunctuation))) {}
+
+    ~CommaLocale()
+    {
+        std::locale::global(itsPrevious);
+    }
+
+    CommaLocale(const CommaLocale&) = delete;
+    CommaLocale& operator=(const CommaLocale&) = delete;
+
+private:
+    std::locale itsPrevious;
+};
+
+#endif
