@@ -10,22 +10,9 @@
 #include <sstream>
 
 #include "support/CapturedStreams.h"
+#include "support/CommaLocale.h"
 
 namespace {
-
-/// A locale that groups digits: 1.234.567.
-class Grouping : public std::numpunct<char> {
-protected:
-    char do_thousands_sep() const override
-    {
-        return '.';
-    }
-
-    std::string do_grouping() const override
-    {
-        return "\3";
-    }
-};
 
 /// Counts how often it is written to and flushed.
 class CallCounter : public std::stringbuf {
@@ -61,7 +48,7 @@ TEST(Messages, ComposesALineOfTextsCharactersAndIntegers)
 TEST(Messages, AreIndependentOfTheStreamsSettings)
 {
     std::ostringstream os;
-    os.imbue(std::locale(std::locale::classic(), new Grouping));
+    os.imbue(std::locale(std::locale::classic(), new CommaPunctuation));
     os << std::hex << std::showbase << std::showpos << std::setfill('*') << std::setw(30);
     messages::writeLine(os, "n=", 1234567, ';');
     EXPECT_EQ(os.str(), "n=1234567;\n");
