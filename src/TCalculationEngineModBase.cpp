@@ -78,7 +78,7 @@ T8* backward(const Decision& rule, unsigned n, const T8* g, T8* b)
 {
     auto metrics = load(rule, *b);
     for (unsigned j = 1; j < n; ++j) {
-        metrics = trellis::backwardStep(rule, metrics, branchMetrics(*g--));
+        metrics = trellis::backwardStep(rule, trellis::candidates(rule, metrics, branchMetrics(*g--)));
         store(rule, metrics, *--b);
     }
     return b - 1;
@@ -183,7 +183,7 @@ T8* TCalculationEngineModBase::mod_gamma(
     const std::int32_t lo = wrap16(arithmetic::shiftLeftWrap(itsBranchFormat->itsMinQ, itsStateFormat->itsShift));
     const std::int32_t hi = wrap16(arithmetic::shiftLeftWrap(itsBranchFormat->itsMaxQ, itsStateFormat->itsShift));
     for (unsigned k = 0; k < n; ++k) {
-        const auto sums = trellis::branchSums<std::int32_t>(intrinsic[k], parity0[k], parity1[k]);
+        const auto sums = trellis::branchSums<std::int32_t>(2 * intrinsic[k], parity0[k], parity1[k]);
         for (unsigned i = 0; i < sums.size(); ++i) {
             g[k][i] = wrap16(arithmetic::clip(sums[i], lo, hi));
         }

@@ -8,6 +8,8 @@
 
 #include "Arithmetic.h"
 #include "Messages.h"
+#include "Segmentation.h"
+#include "Trellis.h"
 
 namespace {
 
@@ -24,28 +26,6 @@ T8 border(const T8& column)
         kept[state] = arithmetic::maskBits(column[state], arithmetic::borderMask);
     }
     return kept;
-}
-
-/// The number of segments doubles until every thread has one or they would become shorter than 64 steps.
-std::uint32_t segmentCount(std::uint32_t K, std::uint64_t threads)
-{
-    std::uint64_t count = 1;
-    if (threads >= 2 && K >= 128) {
-        do {
-            count *= 2;
-        } while (count < threads && 128 * count <= K);
-    }
-    return static_cast<std::uint32_t>(count);
-}
-
-/// The steps of the next window when `rest` steps of the segment remain: 64, and the last 65 to 127
-/// in two halves, the longer first.
-std::uint32_t windowLength(std::uint32_t rest)
-{
-    if (rest >= 128) {
-        return 64;
-    }
-    return rest > 64 ? (rest + 1) / 2 : rest;
 }
 
 /// Reads one of the decoder's numbers; false, after an error line, when it is missing or 0.
@@ -143,7 +123,7 @@ bool TDecoder3GPU::buildSegments(std::uint32_t K)
 {
     itsAlphaSegment.clear();
     itsBetaSegment.clear();
-    itsNT = segmentCount(K, std::uint64_t{itsNumPU} * itsThreadsPerPU);
+    itsNT = segmentation::segmentCount(K, std::uint64_t{itsNumPU} * itsThreadsPerPU);
     if (itsTraceLevel > 0) {
         messages::writeLine(messages::output(), "itsNT=", itsNT);
     }
@@ -157,13 +137,12 @@ bool TDecoder3GPU::buildSegments(std::uint32_t K)
         segments.push_back({u * length, (u + 1) * length});
     }
     std::vector<ABSegment> windows;
-    for (std::uint32_t offset = 0; offset < length;) {
-        const std::uint32_t next = offset + windowLength(length - offset);
+    const std::vector<std::uint32_t> starts = segmentation::windowStarts(length);
+    for (std::size_t row = 0; row + 1 < starts.size(); ++row) {
         for (std::uint32_t u = 0; u < itsNT; ++u) {
-            const std::uint32_t first = u * length + offset;
-            windows.push_back({u * length + next - 1, first == 0 ? 0 : first - 1});
+            const std::uint32_t first = u * length + starts[row];
+            windows.push_back({u * length + starts[row + 1] - 1, first == 0 ? 0 : first - 1});
         }
-        offset = next;
     }
     itsAlphaSegment = std::move(segments);
     itsBetaSegment = std::move(windows);
@@ -309,26 +288,13 @@ bool TDecoder3GPU::preCalcBetaTail(unsigned int h, T8* column) const
 {
     const unsigned d = constituent(h);
     const std::size_t K = itsBlockSize - tailSteps;
-    const auto x = [&](unsigned step) {
-        return int{itsSys[d][K + step]};
-    };
-    const auto p = [&](unsigned step) {
-        return int{itsPar0[d][K + step]};
-    };
-    const auto q = [&](unsigned step) {
-        return int{itsPar1[d][K + step]};
-    };
-    const int e2 = x(2) + p(2) + q(2);
-    const int e1 = x(1) + p(1) + q(1);
-    const int f1 = x(1) - p(1) + q(1);
-    const int metrics[8] = {-e2 - e1 - (x(0) + p(0) + q(0)),
-                            -e2 - e1 + (x(0) + p(0) + q(0)),
-                            -e2 + e1 + (x(0) - p(0) + q(0)),
-                            -e2 + e1 - (x(0) - p(0) + q(0)),
-                            e2 + f1 - (x(0) - p(0) - q(0)),
-                            e2 + f1 + (x(0) - p(0) - q(0)),
-                            e2 - f1 + (x(0) + p(0) - q(0)),
-                            e2 - f1 - (x(0) + p(0) - q(0))};
+    trellis::Tail<int> tail{};
+    for (unsigned step = 0; step < tailSteps; ++step) {
+        tail.x[step] = itsSys[d][K + step];
+        tail.p[step] = itsPar0[d][K + step];
+        tail.q[step] = itsPar1[d][K + step];
+    }
+    const auto metrics = trellis::tailColumn(tail);
     for (unsigned state = 0; state < 8; ++state) {
         (*column)[state] = arithmetic::wrap16(metrics[state]);
     }

@@ -13,6 +13,8 @@
 #define MORVIK_TRELLIS_H
 
 #include <array>
+#include <type_traits>
+#include <utility>
 
 #include "Arithmetic.h"
 
@@ -50,6 +52,19 @@ constexpr unsigned branch(unsigned state)
     return state / 2;
 }
 
+template <class Step, unsigned... index>
+constexpr void unrolled([[maybe_unused]] Step step, std::integer_sequence<unsigned, index...>)
+{
+    (step(std::integral_constant<unsigned, index>{}), ...);
+}
+
+/// Calls step(0) to step(count - 1) with indices that are constants, so that columns stay in registers.
+template <unsigned count, class Step>
+constexpr void forEach([[maybe_unused]] Step step)
+{
+    unrolled(step, std::make_integer_sequence<unsigned, count>{});
+}
+
 template <class Value>
 using BranchMetrics = std::array<Value, 4>;
 
@@ -58,10 +73,12 @@ using Column = std::array<typename Decision::Metric, stateCount>;
 
 /// The four branch metrics of a step before they are clipped: 2 i +- p +- q (rule 5).
 template <class Wide>
-constexpr BranchMetrics<Wide> branchSums(Wide intrinsic, Wide parity0, Wide parity1)
+constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide parity0, Wide parity1)
 {
-    const Wide i2 = intrinsic + intrinsic;
-    return {i2 + parity0 + parity1, i2 - parity0 + parity1, i2 - parity0 - parity1, i2 + parity0 - parity1};
+    return {twiceIntrinsic + parity0 + parity1,
+            twiceIntrinsic - parity0 + parity1,
+            twiceIntrinsic - parity0 - parity1,
+            twiceIntrinsic + parity0 - parity1};
 }
 
 /// Forward: the column after a step, each state decided between its two predecessors, the one on bit 1
@@ -70,47 +87,67 @@ template <class Decision, class Value>
 constexpr Column<Decision> forwardStep(const Decision& rule, const Column<Decision>& a, const BranchMetrics<Value>& g)
 {
     Column<Decision> next{};
-    for (unsigned state = 0; state < stateCount; ++state) {
-        const unsigned one = predecessor(state, 1);
-        const unsigned zero = predecessor(state, 0);
-        const Value metric = g[branch(one)];  // the two are a pair
-        next[state] = rule.decide(rule.add(a[one], metric), rule.subtract(a[zero], metric));
-    }
+    forEach<stateCount>([&](auto state) {
+        constexpr unsigned one = predecessor(state, 1);
+        constexpr unsigned zero = predecessor(state, 0);
+        constexpr unsigned pair = branch(one);  // the two are one
+        next[state] = rule.decide(rule.add(a[one], g[pair]), rule.subtract(a[zero], g[pair]));
+    });
     return next;
+}
+
+/// The metrics of the two branches that leave each state, the backward metric of the far end included.
+template <class Decision>
+struct Candidates {
+    Column<Decision> one;   ///< on bit 1
+    Column<Decision> zero;  ///< on bit 0
+};
+
+template <class Decision, class Value>
+constexpr Candidates<Decision> candidates(const Decision& rule,
+                                          const Column<Decision>& b,
+                                          const BranchMetrics<Value>& g)
+{
+    Candidates<Decision> c{};
+    forEach<stateCount>([&](auto state) {
+        constexpr unsigned afterOne = successor(state, 1);
+        constexpr unsigned afterZero = successor(state, 0);
+        constexpr unsigned pair = branch(state);
+        c.one[state] = rule.add(b[afterOne], g[pair]);
+        c.zero[state] = rule.subtract(b[afterZero], g[pair]);
+    });
+    return c;
 }
 
 /// Backward: the column before a step, each state decided between its two successors, the one on bit 1
 /// first (rule 6).
-template <class Decision, class Value>
-constexpr Column<Decision> backwardStep(const Decision& rule, const Column<Decision>& b, const BranchMetrics<Value>& g)
+template <class Decision>
+constexpr Column<Decision> backwardStep(const Decision& rule, const Candidates<Decision>& c)
 {
     Column<Decision> previous{};
-    for (unsigned state = 0; state < stateCount; ++state) {
-        const Value metric = g[branch(state)];
-        previous[state] =
-            rule.decide(rule.add(b[successor(state, 1)], metric), rule.subtract(b[successor(state, 0)], metric));
-    }
+    forEach<stateCount>([&](auto state) { previous[state] = rule.decide(c.one[state], c.zero[state]); });
     return previous;
 }
 
 /// The best metric of all branches with `bit`, as a tree of decisions: the two states of a pair
 /// share a branch metric, so they are decided first, the odd one being the first candidate, then
 /// pairs, then halves (rule 8).
-template <class Decision, class Value>
+template <unsigned bit, class Decision, class Value>
 constexpr Value bestPath(const Decision& rule,
-                         unsigned bit,
                          const std::array<Value, stateCount>& a,
                          const std::array<Value, stateCount>& b,
                          const BranchMetrics<Value>& g)
 {
     std::array<typename Decision::Metric, 4> pair{};
-    for (unsigned i = 0; i < 4; ++i) {
-        const unsigned odd = 2 * i + 1;
-        const unsigned even = 2 * i;
-        const auto best = rule.decide(rule.metric(addWrap(a[odd], b[successor(odd, bit)])),
-                                      rule.metric(addWrap(a[even], b[successor(even, bit)])));
+    forEach<4>([&](auto i) {
+        constexpr unsigned odd = 2 * i + 1;
+        constexpr unsigned even = 2 * i;
+        constexpr unsigned afterOdd = successor(odd, bit);
+        constexpr unsigned afterEven = successor(even, bit);
+        const auto best =
+            rule.decide(rule.metric(addWrap(a[odd], b[afterOdd])), rule.metric(addWrap(a[even], b[afterEven])));
         pair[i] = bit != 0 ? rule.add(best, g[i]) : rule.subtract(best, g[i]);
-    }
+    });
     return rule.settled(rule.decide(rule.decide(pair[0], pair[1]), rule.decide(pair[2], pair[3])));
 }
 
@@ -121,7 +158,34 @@ constexpr Value logLikelihoodRatio(const Decision& rule,
                                    const std::array<Value, stateCount>& b,
                                    const BranchMetrics<Value>& g)
 {
-    return subWrap(bestPath(rule, 1, a, b, g), bestPath(rule, 0, a, b, g));
+    return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));
+}
+
+/// The three steps of the termination tail: systematic values and those of the parity streams.
+template <class Wide>
+struct Tail {
+    Wide x[3];
+    Wide p[3];
+    Wide q[3];
+};
+
+/// The backward metrics before the tail, in closed form: from each state, one path leads back to state 0
+/// (rule 12). They are neither clipped nor wrapped here.
+template <class Wide>
+constexpr std::array<Wide, stateCount> tailColumn(const Tail<Wide>& t)
+{
+    const Wide e2 = t.x[2] + t.p[2] + t.q[2];
+    const Wide e1 = t.x[1] + t.p[1] + t.q[1];
+    const Wide f1 = t.x[1] - t.p[1] + t.q[1];
+    const auto [g0, g1, g2, g3] = branchSums(t.x[0], t.p[0], t.q[0]);
+    return {-e2 - e1 - g0,
+            -e2 - e1 + g0,
+            -e2 + e1 + g1,
+            -e2 + e1 - g1,
+            e2 + f1 - g2,
+            e2 + f1 + g2,
+            e2 - f1 + g3,
+            e2 - f1 - g3};
 }
 
 }  // namespace trellis

@@ -7,17 +7,16 @@
 #include <string>
 #include <vector>
 
-#include "Arithmetic.h"
 #include "DecoderState.h"
+#include "LanePath.h"
 #include "Messages.h"
+#include "SimulationCall.h"
 
 namespace {
 
 using Generics = veltra_ip_morvik_v1_0_generics;
-using State = veltra_ip_morvik_v1_0_state;
+using namespace simulation_call;
 using Outputs = veltra_ip_morvik_v1_0_outputs;
-
-enum Status : std::int32_t { success = 0, refused = 1, decodeFailed = 2, exceptionRaised = 99 };
 
 /// What is wrong with the generics, or null.
 const char* checkGenerics(const Generics& generics)
@@ -89,6 +88,9 @@ const char* buildComponents(State& state)
     state.decoder->itsInterleaver = state.interleaver;
     state.decoder->itsEngine = state.engine;
     state.decoder->itsExtrinsicScale = generics.C_ALGORITHM_TYPE == 1 ? 0.75 : 1.0;
+    state.lane_path = new LanePath(static_cast<TDecoder3GPU&>(*state.decoder),
+                                   static_cast<lanes::Algorithm>(generics.C_ALGORITHM_TYPE),
+                                   lanes::bestInstructionSet());
     return nullptr;
 }
 
@@ -98,94 +100,6 @@ void release(Component*& component)
 {
     delete component;
     component = nullptr;
-}
-
-/// What is wrong with the arguments of a simulation call, or null.
-const char* checkArguments(const State* state,
-                           const std::int32_t* const (&streams)[3],
-                           std::int32_t dinSize,
-                           std::uint32_t iterations,
-                           const Outputs* outputs)
-{
-    if (state == nullptr) {
-        return "Simulate called with null state structure";
-    }
-    if (outputs == nullptr) {
-        return "Simulate called with null output structure";
-    }
-    if (outputs->dout == nullptr) {
-        return "Simulate called with null pointer for dout";
-    }
-    if (dinSize < 1) {
-        return "din_size must be a positive integer";
-    }
-    if (streams[0] == nullptr) {
-        return "rsc1_sys must not be a null pointer";
-    }
-    if (streams[1] == nullptr) {
-        return "rsc1_par must not be a null pointer";
-    }
-    if (streams[2] == nullptr) {
-        return "rsc2_par must not be a null pointer";
-    }
-    if (iterations < 1 || iterations > 15) {
-        return "Number of iterations must be in the range 1 to 15";
-    }
-    return nullptr;
-}
-
-/// A caller's value in the state format, clipped to the input format (rule 4). `saturated` is set
-/// to -1 or 1 when it was clipped, to 0 otherwise.
-short convertInput(std::int32_t value, const TNumberFormat& input, const TNumberFormat& state, int& saturated)
-{
-    const std::int32_t aligned = arithmetic::shiftLeftWrap(value, input.itsShift);
-    const std::int32_t clipped = arithmetic::clip<std::int32_t>(aligned, input.itsMin, input.itsMax);
-    saturated = clipped < aligned ? 1 : (clipped > aligned ? -1 : 0);
-    return state.place(input.integer(arithmetic::wrap16(clipped)));
-}
-
-/// Joins the caller's three streams, position by position, into aligned soft values. The first
-/// value of a state's life that has to be clipped is reported.
-std::vector<short> convertInputs(State& state, const std::int32_t* const (&streams)[3], std::int32_t dinSize)
-{
-    static constexpr const char* streamNames[3] = {"RSC1 systematic", "RSC1 parity", "RSC2 parity"};
-    std::vector<short> soft;
-    soft.reserve(3 * static_cast<std::size_t>(dinSize));
-    for (std::int32_t i = 0; i < dinSize; ++i) {
-        for (unsigned s = 0; s < 3; ++s) {
-            int saturated = 0;
-            soft.push_back(convertInput(streams[s][i], *state.input_format, *state.state_format, saturated));
-            if (saturated != 0 && !state.saturation_reported) {
-                messages::writeWarning("WARNING:decoder:",
-                                       streamNames[s],
-                                       " value in position ",
-                                       i,
-                                       saturated > 0 ? " saturated positively" : " saturated negatively",
-                                       ", further saturation will not be reported");
-                state.saturation_reported = true;
-            }
-        }
-    }
-    return soft;
-}
-
-/// The tag's bits that the core carries. The first tag of a state's life that loses bits is reported.
-std::uint32_t truncateTag(State& state, std::uint32_t tag)
-{
-    const std::uint32_t kept = tag & state.tag_mask;
-    if (kept != tag && !state.tag_truncation_reported) {
-        messages::writeWarning("WARNING:decoder:Input block tag has been truncated to ",
-                               state.generics.C_TAG_WIDTH,
-                               " bits, further truncation will not be reported");
-        state.tag_truncation_reported = true;
-    }
-    return kept;
-}
-
-Status refuse(const char* reason)
-{
-    messages::writeError("ERROR:decoder:", reason);
-    return refused;
 }
 
 }  // namespace
@@ -250,6 +164,7 @@ void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state* state)
     if (state == nullptr) {
         return;
     }
+    release(state->lane_path);
     release(state->state_format);
     release(state->branch_format);
     release(state->input_format);
@@ -274,25 +189,34 @@ int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state
                                               uint32_t tag,
                                               veltra_ip_morvik_v1_0_outputs* outputs)
 {
-    const std::int32_t* const streams[3] = {rsc1_sys, rsc1_par, rsc2_par};
-    if (const char* reason = checkArguments(state, streams, din_size, iterations, outputs)) {
+    const lanes::Streams<std::int32_t> streams = {rsc1_sys, rsc1_par, rsc2_par};
+    const std::uint8_t* dout = outputs == nullptr ? nullptr : outputs->dout;
+    if (const char* reason = checkArguments(state, outputs != nullptr, dout, streams, din_size, iterations)) {
         return refuse(reason);
     }
-    const std::vector<short> soft = convertInputs(*state, streams, din_size);
+    const bool byLanes = lanesTake(*state, din_size);
     std::vector<unsigned char> hard;
-    try {
-        if (!state->decoder->decode(soft, hard, iterations)) {
-            return decodeFailed;
+    std::size_t K = 0;
+    if (byLanes) {
+        K = static_cast<std::size_t>(din_size) - 4;
+        loadLanes<std::int32_t>(*state, &streams, 1, din_size, nullptr);
+        state->lane_path->decode(iterations);
+    } else {
+        const Status status = decodeByComponents(*state, streams, din_size, iterations, hard);
+        if (status != success) {
+            return status;
         }
-    } catch (...) {
-        refuse("Unhandled exception has occurred");
-        return exceptionRaised;
+        K = hard.size();
     }
-    if (outputs->dout_alloc < hard.size()) {
+    if (outputs->dout_alloc < K) {
         return refuse("Insufficient allocated space for output array");
     }
-    std::copy(hard.begin(), hard.end(), outputs->dout);
-    outputs->dout_size = static_cast<std::uint32_t>(hard.size());
+    if (byLanes) {
+        state->lane_path->decisions(&outputs->dout);
+    } else {
+        std::copy(hard.begin(), hard.end(), outputs->dout);
+    }
+    outputs->dout_size = static_cast<std::uint32_t>(K);
     outputs->tag = truncateTag(*state, tag);
     return success;
 }

@@ -259,6 +259,7 @@ TEST(TDecoder3GPU, EndsWithTheRatiosAndExtrinsicValuesOfThePlainFormulation)
     for (const int units : {2, 4, 8}) {
         for (const int algorithm : algorithms) {
             blocks::Decoder decoder(units, algorithm);
+            decoder.decodeByComponents();
             for (const unsigned K : {48U, 128U, 832U, 2112U, 6144U}) {
                 SCOPED_TRACE(testing::Message() << units << " units, type " << algorithm << " K=" << K);
                 const blocks::Block block = blocks::randomBlock(random, K, blocks::Values::uniform);

@@ -262,7 +262,7 @@ TEST(AllocationFailure, OfADecodeLeavesAWorkingState)
             while (which < manyAllocations && decodeWithFailure(which, traced, before, block, expected)) {
                 ++which;
             }
-            EXPECT_GE(which, 3U);
+            EXPECT_GE(which, K == previous && traced == 0 ? 1U : 3U);  // all memory is kept for the next block
             EXPECT_LT(which, manyAllocations);
             EXPECT_EQ(liveBlocks, live);
         }

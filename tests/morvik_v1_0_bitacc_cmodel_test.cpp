@@ -1,5 +1,6 @@
 // morvik_v1_0_bitacc_cmodel: generics, state, trace switch and block simulation.
 #include "morvik_v1_0_bitacc_cmodel.h"
+#include "morvik_v1_0_batch.h"
 
 #include <gtest/gtest.h>
 
@@ -395,6 +396,7 @@ TEST(Simulate, ClipsAndAlignsInputs)
     for (std::size_t i = 0; i < values.size(); ++i) {
         block.sys[i] = values[i].first;
     }
+    EXPECT_EQ(veltra_ip_morvik_v1_0_set_instruction_set(state.get(), "component"), 0);
     Call call(state.get(), block);
     EXPECT_EQ(call.run(), 0);
     const auto& decoder = dynamic_cast<const TDecoder3GPU&>(*state->decoder);
@@ -536,6 +538,7 @@ TEST(Simulate, ReportsAnExceptionOfTheDecoderAs99)
             throw std::bad_alloc();
         }
     };
+    EXPECT_EQ(veltra_ip_morvik_v1_0_set_instruction_set(state.get(), "component"), 0);
     delete state->decoder;
     state->decoder = new Throwing;
     Call call(state.get(), quietBlock(40));

@@ -8,6 +8,8 @@
 
 #include "TInterleaver.h"
 
+#include "morvik_v1_0_batch.h"
+
 namespace blocks {
 
 namespace {
@@ -156,6 +158,11 @@ Decoder::Decoder(int units, int algorithm, int tagWidth) : itsState(nullptr)
 Decoder::~Decoder()
 {
     veltra_ip_morvik_v1_0_destroy_state(itsState);
+}
+
+void Decoder::decodeByComponents()
+{
+    veltra_ip_morvik_v1_0_set_instruction_set(itsState, "component");
 }
 
 Decoder::Result Decoder::decode(const Block& block, unsigned iterations, std::uint32_t tag)

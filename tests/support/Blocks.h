@@ -61,6 +61,9 @@ public:
         return itsState;
     }
 
+    /// From now on the components decode, so that their columns and values can be looked at.
+    void decodeByComponents();
+
     struct Result {
         int status;
         std::vector<std::uint8_t> bits;  ///< empty unless status is 0

@@ -1,0 +1,45 @@
+// Bounds: how far apart metrics can lie, and what the lanes may therefore leave out.
+//
+// All in steps; the hardware's registers wrap at 4096, so comparisons by the wrapped difference and plain
+// comparisons agree while true differences stay within -2048 ... 2047. Branch metrics are clipped to
+// -128 ... 127 and any state is reached from any other in three steps, over a branch pair that shares its
+// metric in the last one. From that follow, step by step (lane_bounds_test computes them):
+//
+//   between two states of a column             within 786, 793 in a kept border column,
+//                                              1292 in the three steps after a known start,
+//                                              1287 in the tail's column
+//   between two candidates of a recursion      within 1554
+//   between two branches of a ratio's tree     within 1606, but 2351 in the first three steps of a block
+//                                              and in its last one
+//   a ratio                                    within 1072
+//
+// Corrections of MOD#, 6 steps at most for each decision, are counted in. So the recursions may decide by
+// a plain maximum everywhere, and ratios everywhere but in those four steps.
+//
+// In 64 steps a metric grows by 64 (128 + 6) at most; a column that starts within 1300 of 0 stays within
+// 9900, and the sum of a forward and a backward one within 20000: no 16-bit word overflows in a window.
+// Between windows columns are brought back to 0 by multiples of 8, because a border column loses its three
+// low bits (rule 11), and clearing them commutes with such a shift.
+#ifndef MORVIK_LANES_BOUNDS_H
+#define MORVIK_LANES_BOUNDS_H
+
+namespace lanes {
+
+constexpr unsigned longestWindow = 64;
+
+constexpr unsigned wrappingFirstSteps = 3;
+constexpr unsigned wrappingLastSteps = 1;
+
+/// The branch format's limits.
+constexpr int branchMin = -128;
+constexpr int branchMax = 127;
+
+/// Every state but 0 of a known start column.
+constexpr int unlikely = -1024;
+
+/// The bits of a metric that a border column keeps.
+constexpr int borderMask = ~7;
+
+}  // namespace lanes
+
+#endif

@@ -1,0 +1,46 @@
+// InstructionSets: the compilations of the lanes, and which of them this machine can run.
+#include "InstructionSets.h"
+
+// One compilation of Kernels.cpp defines each.
+namespace lanes_generic {
+extern const lanes::InstructionSet instructionSet;
+}
+#if defined(__x86_64__) || defined(__i386__)
+namespace lanes_ssse3 {
+extern const lanes::InstructionSet instructionSet;
+}
+namespace lanes_avx2 {
+extern const lanes::InstructionSet instructionSet;
+}
+namespace lanes_avx512 {
+extern const lanes::InstructionSet instructionSet;
+}
+#endif
+
+namespace lanes {
+
+std::vector<const InstructionSet*> availableInstructionSets()
+{
+    std::vector<const InstructionSet*> sets;
+#if defined(__x86_64__) || defined(__i386__)
+    __builtin_cpu_init();
+    if (__builtin_cpu_supports("avx512bw") && __builtin_cpu_supports("avx512vl")) {
+        sets.push_back(&lanes_avx512::instructionSet);
+    }
+    if (__builtin_cpu_supports("avx2")) {
+        sets.push_back(&lanes_avx2::instructionSet);
+    }
+    if (__builtin_cpu_supports("ssse3")) {
+        sets.push_back(&lanes_ssse3::instructionSet);
+    }
+#endif
+    sets.push_back(&lanes_generic::instructionSet);
+    return sets;
+}
+
+const InstructionSet& bestInstructionSet()
+{
+    return *availableInstructionSets().front();
+}
+
+}  // namespace lanes

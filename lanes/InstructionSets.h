@@ -1,0 +1,19 @@
+// InstructionSets: the compilations of the lanes, and which of them this machine can run.
+#ifndef MORVIK_LANES_INSTRUCTIONSETS_H
+#define MORVIK_LANES_INSTRUCTIONSETS_H
+
+#include <vector>
+
+#include "Kernels.h"
+
+namespace lanes {
+
+/// Those that this machine can run, the best one first. The last one runs everywhere.
+std::vector<const InstructionSet*> availableInstructionSets();
+
+/// The best one.
+const InstructionSet& bestInstructionSet();
+
+}  // namespace lanes
+
+#endif

@@ -1,0 +1,114 @@
+// Kernels: the lanes, compiled once for each instruction set (lanes/CMakeLists.txt).
+#include "Kernels.h"
+
+#include "Pass.h"
+#include "Transpose.h"
+
+namespace MORVIK_LANES {
+namespace {
+
+template <unsigned count, unsigned vectors>
+struct Shape {
+    static constexpr unsigned lanes = count * vectors;
+    using LanesOfRow = Permutation<count, vectors>;
+
+    static void prepare(const std::uint8_t* source, std::uint8_t* control)
+    {
+        for (unsigned v = 0; v < vectors; ++v) {
+            LanesOfRow::prepare(source + v * count, control + v * LanesOfRow::bytes);
+        }
+    }
+
+    template <class Input>
+    static bool load(const Input* const* arrays, unsigned steps, std::int16_t* rows)
+    {
+        return loadRows(arrays, lanes, steps, rows);
+    }
+
+    template <class Output>
+    static void store(const std::int16_t* rows, unsigned steps, Output* const* arrays)
+    {
+        storeRows(rows, lanes, steps, arrays);
+    }
+
+    static void decode(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned halfIterations)
+    {
+        interleave(workspace);
+        switch (algorithm) {
+        case lanes::Algorithm::greatest:
+            return runPasses<Greatest<count>, false>(workspace, halfIterations);
+        case lanes::Algorithm::greatestScaled:
+            return runPasses<Greatest<count>, true>(workspace, halfIterations);
+        case lanes::Algorithm::corrected:
+            return runPasses<Corrected<count>, false>(workspace, halfIterations);
+        }
+    }
+
+    /// Decoder 1's systematic values are decoder 0's, in interleaved order.
+    static void interleave(const lanes::Workspace& workspace)
+    {
+        const lanes::ConstituentRows& rows = workspace.constituent[1];
+        for (unsigned k = 0; k < workspace.steps; ++k) {
+            const std::int16_t* source = workspace.constituent[0].systematic + rows.sourceRow[k] * lanes;
+            for (unsigned v = 0; v < vectors; ++v) {
+                const unsigned at = k * vectors + v;
+                LanesOfRow::load(source, rows.permutations + at * LanesOfRow::bytes)
+                    .store(rows.systematic + at * count);
+            }
+        }
+    }
+
+    /// Even passes belong to decoder 1, odd ones to decoder 0 (rule 15). Pass 0 knows nothing beforehand.
+    template <class Rule, bool scaled>
+    static void runPasses(const lanes::Workspace& workspace, unsigned halfIterations)
+    {
+        const std::int16_t* joint = workspace.constituent[0].systematic;
+        for (unsigned h = 0; h < halfIterations; ++h) {
+            const unsigned d = h % 2 == 0 ? 1 : 0;
+            if (h + 1 < halfIterations) {
+                runPass<Rule, vectors, scaled, false>(workspace, d, joint, h < 2);
+            } else {
+                runPass<Rule, vectors, scaled, true>(workspace, d, joint, h < 2);
+            }
+            joint = workspace.constituent[d].joint;
+        }
+    }
+
+    static constexpr unsigned slotBytes = 2 * count * (trellis::stateCount + 3);
+    static constexpr unsigned forwardBytes = 2 * vectors * sizeof(Steps<count>) * trellis::stateCount;
+
+    static constexpr lanes::Kernel kernel = {lanes,
+                                             count,
+                                             vectors* LanesOfRow::bytes,
+                                             slotBytes,
+                                             forwardBytes,
+                                             prepare,
+                                             load<std::int32_t>,
+                                             load<std::int16_t>,
+                                             load<std::int8_t>,
+                                             decode,
+                                             store<std::uint8_t>,
+                                             store<std::int16_t>};
+};
+
+constexpr lanes::Kernel kernels[] = {
+    Shape<8, 1>::kernel,
+#if defined(__AVX512BW__)
+    Shape<16, 1>::kernel,
+    Shape<32, 1>::kernel,
+#elif defined(__AVX2__)
+    Shape<16, 1>::kernel,
+    Shape<16, 2>::kernel,
+#else
+    Shape<8, 2>::kernel,
+    Shape<8, 4>::kernel,
+#endif
+};
+
+}  // namespace
+
+extern const lanes::InstructionSet instructionSet;
+const lanes::InstructionSet instructionSet = {
+    MORVIK_LANES_NAME, kernels, static_cast<unsigned>(sizeof kernels / sizeof kernels[0])};
+
+}  // namespace MORVIK_LANES

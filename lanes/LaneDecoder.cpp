@@ -1,0 +1,302 @@
+// LaneDecoder: decodes blocks of one size, one lane for each segment, several blocks at once.
+#include "LaneDecoder.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "../src/Trellis.h"
+#include "Bounds.h"
+
+namespace lanes {
+
+namespace {
+
+constexpr unsigned mostLanes = 32;
+constexpr unsigned states = trellis::stateCount;
+
+/// Hands out arrays from a stretch of memory, or adds up their size when there is none yet. Each begins
+/// on a cache line, at an offset that keeps equal steps of different arrays in different sets of the cache.
+class Layout {
+public:
+    static constexpr std::size_t line = 64;
+
+    explicit Layout(unsigned char* base) : itsBase(base) {}
+
+    template <class Element>
+    Element* take(std::size_t count)
+    {
+        const std::size_t offset = itsSize;
+        itsSize += (count * sizeof(Element) + line - 1) / line * line + stagger;
+        return itsBase == nullptr ? nullptr : reinterpret_cast<Element*>(itsBase + offset);
+    }
+
+    std::size_t size() const
+    {
+        return itsSize;
+    }
+
+private:
+    static constexpr std::size_t stagger = 5 * line;
+    unsigned char* const itsBase;
+    std::size_t itsSize = 0;
+};
+
+bool loadRows(const Kernel& kernel, const std::int32_t* const* arrays, unsigned steps, std::int16_t* rows)
+{
+    return kernel.loadWords(arrays, steps, rows);
+}
+
+bool loadRows(const Kernel& kernel, const std::int16_t* const* arrays, unsigned steps, std::int16_t* rows)
+{
+    return kernel.loadHalfWords(arrays, steps, rows);
+}
+
+bool loadRows(const Kernel& kernel, const std::int8_t* const* arrays, unsigned steps, std::int16_t* rows)
+{
+    return kernel.loadBytes(arrays, steps, rows);
+}
+
+}  // namespace
+
+LaneDecoder::LaneDecoder(const InstructionSet& instructionSet, Algorithm algorithm, const CorrectionTable& corrections)
+    : itsInstructionSet(instructionSet),
+      itsAlgorithm(algorithm),
+      itsCorrections(corrections),
+      itsWork(instructionSet.kernelCount)
+{
+}
+
+void LaneDecoder::setBlockCut(BlockCut cut)
+{
+    std::vector<unsigned> inverse(cut.blockSize);
+    for (unsigned i = 0; i < cut.blockSize; ++i) {
+        inverse[cut.permutation[i]] = i;
+    }
+    itsInverse = std::move(inverse);
+    itsCut = std::move(cut);
+    itsBlocks = 0;
+}
+
+unsigned LaneDecoder::steps() const
+{
+    return itsCut.blockSize / itsCut.segments;
+}
+
+/// The narrowest kernel that has room for all of them, or the widest.
+const Kernel& LaneDecoder::kernelFor(unsigned blocks) const
+{
+    const Kernel* kernel = itsInstructionSet.kernels;
+    const Kernel* const widest = kernel + itsInstructionSet.kernelCount - 1;
+    while (kernel != widest && kernel->lanes / itsCut.segments < blocks) {
+        ++kernel;
+    }
+    return *kernel;
+}
+
+unsigned LaneDecoder::blocksTaken(unsigned blocks) const
+{
+    return std::min(blocks, kernelFor(blocks).lanes / itsCut.segments);
+}
+
+void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
+{
+    work.blockSize = 0;
+    work.storage.resize(layOut(kernel, work, nullptr) + Layout::line);
+    void* base = work.storage.data();
+    std::size_t space = work.storage.size();
+    layOut(kernel, work, static_cast<unsigned char*>(std::align(Layout::line, 1, base, space)));
+    for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
+        const unsigned segment = lane % itsCut.segments;
+        work.firstLanes[lane] = segment == 0 ? -1 : 0;
+        work.lastLanes[lane] = segment == itsCut.segments - 1 ? -1 : 0;
+    }
+    preparePermutation(kernel, work, 0, itsInverse);
+    preparePermutation(kernel, work, 1, itsCut.permutation);
+    work.blockSize = itsCut.blockSize;
+}
+
+std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char* base) const
+{
+    const std::size_t row = kernel.lanes;
+    const std::size_t rows = steps() * row;
+    const std::size_t windows = itsCut.windowStart.size() - 1;
+    Layout layout(base);
+    Workspace& space = work.space;
+    space.segments = itsCut.segments;
+    space.steps = steps();
+    space.windows = static_cast<unsigned>(windows);
+    space.corrections = itsCorrections.data();
+    for (const unsigned d : {0U, 1U}) {
+        work.sourceRow[d] = layout.take<std::uint32_t>(steps() + fetchAhead);
+        work.permutations[d] = layout.take<std::uint8_t>(steps() * std::size_t{kernel.permutationBytes});
+        space.constituent[d] = {layout.take<std::int16_t>(rows),
+                                layout.take<std::int16_t>(rows),
+                                layout.take<std::int16_t>(rows),
+                                work.sourceRow[d],
+                                work.permutations[d],
+                                layout.take<std::int16_t>(states * row),
+                                layout.take<std::int16_t>(windows * states * row)};
+    }
+    space.firstLanes = work.firstLanes = layout.take<std::int16_t>(row);
+    space.lastLanes = work.lastLanes = layout.take<std::int16_t>(row);
+    space.slots = layout.take<std::int16_t>(std::size_t{longestWindow} * kernel.slotBytes / 2);
+    space.forward = layout.take<std::int16_t>(kernel.forwardBytes / 2);
+    space.reached = layout.take<std::int16_t>(2 * states * (row + std::size_t{2} * kernel.vectorLanes));
+    space.ratios = layout.take<std::int16_t>(rows);
+    return layout.size();
+}
+
+/// The interleaver is contention-free: the positions that one step of all segments takes its values from
+/// are one step of all segments in the other order, too.
+void LaneDecoder::preparePermutation(const Kernel& kernel,
+                                     Work& work,
+                                     unsigned d,
+                                     const std::vector<unsigned>& from) const
+{
+    std::uint8_t* control = work.permutations[d];
+    std::uint8_t source[mostLanes] = {};
+    for (unsigned k = 0; k < steps(); ++k) {
+        const unsigned sourceRow = from[k] % steps();
+        for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
+            const unsigned segment = lane % itsCut.segments;
+            const unsigned sourceSegment = (from[k + segment * steps()] - sourceRow) / steps();
+            source[lane] = static_cast<std::uint8_t>(lane - segment + sourceSegment);
+        }
+        kernel.prepare(source, control);
+        control += kernel.permutationBytes;
+        work.sourceRow[d][k] = sourceRow;
+    }
+    std::fill_n(work.sourceRow[d] + steps(), fetchAhead, 0U);
+}
+
+template <class Input>
+bool LaneDecoder::load(const Streams<Input>* blocks, unsigned count)
+{
+    const Kernel& kernel = kernelFor(count);
+    Work& work = itsWork[static_cast<std::size_t>(&kernel - itsInstructionSet.kernels)];
+    if (work.blockSize != itsCut.blockSize) {
+        prepareWork(kernel, work);
+    }
+    itsTails.resize(blocksTaken(count));
+    itsKernel = &kernel;
+    itsCurrent = &work;
+    itsBlocks = blocksTaken(count);
+    work.space.windowStart = itsCut.windowStart.data();  // of the cut as it is now
+    ConstituentRows* const rows = work.space.constituent;
+    bool within = loadStream(blocks, &Streams<Input>::systematic, 0, rows[0].systematic);
+    within = loadStream(blocks, &Streams<Input>::parity1, 1, rows[0].parity) && within;
+    return loadStream(blocks, &Streams<Input>::parity2, 2, rows[1].parity) && within;
+}
+
+template bool LaneDecoder::load(const Streams<std::int32_t>*, unsigned);
+template bool LaneDecoder::load(const Streams<std::int16_t>*, unsigned);
+template bool LaneDecoder::load(const Streams<std::int8_t>*, unsigned);
+
+template <class Input>
+bool LaneDecoder::loadStream(const Streams<Input>* blocks,
+                             const Input* Streams<Input>::*stream,
+                             unsigned s,
+                             std::int16_t* rows)
+{
+    const Input* lanes[mostLanes] = {};
+    for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
+        lanes[lane] = blocks[blockOf(lane)].*stream + lane % itsCut.segments * steps();
+    }
+    bool within = loadRows(*itsKernel, lanes, steps(), rows);
+    for (unsigned block = 0; block < itsBlocks; ++block) {
+        for (unsigned position = 0; position < tailPositions; ++position) {
+            const int value = int{(blocks[block].*stream)[itsCut.blockSize + position]};
+            itsTails[block][3 * position + s] = value;
+            within = within && value >= branchMin && value <= branchMax;
+        }
+    }
+    return within;
+}
+
+/// Lanes without a block repeat the last one, so that their metrics stay within bounds, too.
+unsigned LaneDecoder::blockOf(unsigned lane) const
+{
+    return std::min(lane / itsCut.segments, itsBlocks - 1);
+}
+
+void LaneDecoder::decode(unsigned halfIterations)
+{
+    for (const unsigned d : {0U, 1U}) {
+        prepareStarts(d);
+    }
+    itsKernel->decode(itsCurrent->space, itsAlgorithm, halfIterations);
+    itsLastDecoder = halfIterations % 2;
+}
+
+/// Before the first passes the state is known at a block's ends alone (rules 10, 19, 20).
+void LaneDecoder::prepareStarts(unsigned d)
+{
+    const Workspace& space = itsCurrent->space;
+    const unsigned row = itsKernel->lanes;
+    std::int16_t* const alpha = space.constituent[d].alphaStart;
+    std::int16_t* const beta = space.constituent[d].betaStart;
+    std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * row;
+    std::fill_n(alpha, states * row, std::int16_t{0});
+    std::fill(beta, lastBeta + states * row, std::int16_t{0});
+    for (unsigned first = 0; first < row; first += space.segments) {
+        const std::array<int, 12>& t = itsTails[blockOf(first)];
+        const unsigned o = 6 * d;
+        const auto metrics =
+            trellis::tailColumn<int>({{t[o], t[o + 2], t[o + 4]}, {t[o + 1], t[o + 3], t[o + 5]}, {0, 0, 0}});
+        for (unsigned state = 0; state < states; ++state) {
+            alpha[state * row + first] = state == 0 ? 0 : unlikely;
+            lastBeta[state * row + first + space.segments - 1] = static_cast<std::int16_t>(metrics[state] & borderMask);
+        }
+    }
+}
+
+template <class Output>
+void LaneDecoder::spread(void (*store)(const std::int16_t*, unsigned, Output* const*),
+                         const std::int16_t* rows,
+                         Output* const* blocks)
+{
+    Output scratch[mostSteps];  // what the lanes without a block give
+    Output* lanes[mostLanes] = {};
+    for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
+        const unsigned block = lane / itsCut.segments;
+        lanes[lane] = block < itsBlocks ? blocks[block] + lane % itsCut.segments * steps() : scratch;
+    }
+    store(rows, steps(), lanes);
+}
+
+void LaneDecoder::decisions(std::uint8_t* const* blocks)
+{
+    spread(itsKernel->storeDecisions, itsCurrent->space.ratios, blocks);
+}
+
+void LaneDecoder::ratios(std::int16_t* const* blocks)
+{
+    spread(itsKernel->storeRatios, itsCurrent->space.ratios, blocks);
+}
+
+void LaneDecoder::joint(std::int16_t* const* blocks)
+{
+    spread(itsKernel->storeRatios, itsCurrent->space.constituent[itsLastDecoder == 0 ? 0 : 1].joint, blocks);
+}
+
+LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
+{
+    LoadedBlock streams;
+    const ConstituentRows* const rows = itsCurrent->space.constituent;
+    const std::int16_t* const sources[3] = {rows[0].systematic, rows[0].parity, rows[1].parity};
+    for (unsigned s = 0; s < 3; ++s) {
+        std::vector<std::int16_t>& values = streams[s];
+        values.reserve(itsCut.blockSize + tailPositions);
+        for (unsigned segment = 0; segment < itsCut.segments; ++segment) {
+            for (unsigned k = 0; k < steps(); ++k) {
+                values.push_back(sources[s][k * itsKernel->lanes + block * itsCut.segments + segment]);
+            }
+        }
+        for (unsigned position = 0; position < tailPositions; ++position) {
+            values.push_back(static_cast<std::int16_t>(itsTails[block][3 * position + s]));
+        }
+    }
+    return streams;
+}
+
+}  // namespace lanes

@@ -1,0 +1,122 @@
+// LaneDecoder: decodes blocks of one size, one lane for each segment, several blocks at once.
+#ifndef MORVIK_LANES_LANEDECODER_H
+#define MORVIK_LANES_LANEDECODER_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+#include "Kernels.h"
+
+namespace lanes {
+
+/// How the blocks of a size are cut and permuted.
+struct BlockCut {
+    unsigned blockSize = 0;             ///< K, at most 6144
+    unsigned segments = 0;              ///< a power of two, at most 32, of 8 to 768 steps each
+    std::vector<unsigned> windowStart;  ///< the first step of each window of a segment, then the segment's end
+    std::vector<unsigned> permutation;  ///< K: position i of the interleaved order is position [i] of the natural one
+};
+
+/// The caller's three streams of a block, K + 4 values each.
+template <class Input>
+struct Streams {
+    const Input* systematic;
+    const Input* parity1;
+    const Input* parity2;
+};
+
+/// The three streams of a block as they were loaded.
+using LoadedBlock = std::array<std::vector<std::int16_t>, 3>;
+
+/// The correction table: steps, by a quarter of the difference's magnitude in steps; its last entry also
+/// serves all greater ones.
+using CorrectionTable = std::array<std::uint8_t, 16>;
+
+/// Use: setBlockCut whenever the size changes; then, for some blocks, load, decode and fetch results.
+class LaneDecoder {
+public:
+    LaneDecoder(const InstructionSet& instructionSet, Algorithm algorithm, const CorrectionTable& corrections);
+
+    void setBlockCut(BlockCut cut);
+
+    const BlockCut& blockCut() const
+    {
+        return itsCut;
+    }
+
+    const InstructionSet& instructionSet() const
+    {
+        return itsInstructionSet;
+    }
+
+    /// How many blocks the next load takes when there are `blocks`, 1 or more.
+    unsigned blocksTaken(unsigned blocks) const;
+
+    /// Takes in as many blocks as blocksTaken says. False when a value was beyond the input format: the
+    /// blocks have to be loaded again, clipped. Exhausted memory throws std::bad_alloc.
+    template <class Input>
+    bool load(const Streams<Input>* blocks, unsigned count);
+
+    /// Runs passes 0 to halfIterations - 1, 1 or more, on the blocks that were loaded.
+    void decode(unsigned halfIterations);
+
+    /// The results of the last pass, an array of K values for each block, in the order of the pass's
+    /// constituent decoder: decisions, 0 or 1; ratios, aligned words; and what goes to the next pass, aligned
+    /// words: half of the extrinsic value, rounded down to a step, plus the systematic value.
+    void decisions(std::uint8_t* const* blocks);
+    void ratios(std::int16_t* const* blocks);
+    void joint(std::int16_t* const* blocks);
+
+    /// The input of a block, clipped, as it was loaded last.
+    LoadedBlock loadedBlock(unsigned block) const;
+
+private:
+    static constexpr unsigned tailPositions = 4;
+    static constexpr unsigned mostSteps = 768;
+
+    /// The working memory of one kernel, for one block size.
+    struct Work {
+        unsigned blockSize = 0;  ///< 0: none
+        std::vector<unsigned char> storage;
+        std::uint32_t* sourceRow[2] = {};
+        std::uint8_t* permutations[2] = {};
+        std::int16_t* firstLanes = nullptr;
+        std::int16_t* lastLanes = nullptr;
+        Workspace space = {};
+    };
+
+    unsigned steps() const;
+    unsigned blockOf(unsigned lane) const;
+    const Kernel& kernelFor(unsigned blocks) const;
+    void prepareWork(const Kernel& kernel, Work& work) const;
+    std::size_t layOut(const Kernel& kernel, Work& work, unsigned char* base) const;
+    void preparePermutation(const Kernel& kernel, Work& work, unsigned d, const std::vector<unsigned>& from) const;
+    void prepareStarts(unsigned d);
+
+    template <class Input>
+    bool loadStream(const Streams<Input>* blocks, const Input* Streams<Input>::*stream, unsigned s, std::int16_t* rows);
+
+    template <class Output>
+    void spread(void (*store)(const std::int16_t*, unsigned, Output* const*),
+                const std::int16_t* rows,
+                Output* const* blocks);
+
+    const InstructionSet& itsInstructionSet;
+    const Algorithm itsAlgorithm;
+    const CorrectionTable itsCorrections;
+    BlockCut itsCut;
+    std::vector<unsigned> itsInverse;  ///< of the cut's permutation
+    std::vector<Work> itsWork;         ///< one for each kernel
+    const Kernel* itsKernel = nullptr;
+    Work* itsCurrent = nullptr;
+    unsigned itsBlocks = 0;                     ///< that are loaded
+    unsigned itsLastDecoder = 0;                ///< whose pass was the last one
+    std::vector<std::array<int, 12>> itsTails;  ///< of each block: position by position, three streams
+};
+
+}  // namespace lanes
+
+#endif

@@ -1,0 +1,334 @@
+// Pass: one soft-in/soft-out pass of a constituent decoder, for all lanes of a row at once.
+#ifndef MORVIK_LANES_PASS_H
+#define MORVIK_LANES_PASS_H
+
+#include <cstddef>
+
+#include "../src/Trellis.h"
+#include "Bounds.h"
+#include "Permute.h"
+#include "Rules.h"
+#include "Words.h"
+#include "Workspace.h"
+
+namespace MORVIK_LANES {
+
+/// A pass over rows of `vectors` vectors. The windows of a segment are worked on in turn, each of them in
+/// every lane: the forward recursion leaves its metrics in slots, one for each step; the backward recursion
+/// takes them up and goes on to ratios and joint values. `scaled` says whether extrinsic values are taken
+/// times 0.75.
+template <class Rule, unsigned vectors, bool scaled>
+class Pass {
+    static constexpr unsigned count = Rule::count;
+    static constexpr unsigned states = trellis::stateCount;
+    static constexpr unsigned row = vectors * count;
+    static constexpr unsigned wideRow = row + 2 * count;
+    using Value = Steps<count>;
+    using Values = StepsColumn<count>;
+    using BranchMetrics = StepsBranches<count>;
+    using Decision = typename Rule::Decision;
+    using Column = trellis::Column<Decision>;
+
+public:
+    MORVIK_INLINE Pass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint)
+        : w(workspace), itsRows(workspace.constituent[d]), itsJoint(joint), itsRule(workspace.corrections)
+    {
+    }
+
+    /// `first`: this is the decoder's first pass of the block. `last`: ratios are kept.
+    template <bool last>
+    MORVIK_INLINE void run(bool first) const
+    {
+        for (unsigned v = 0; v < vectors; ++v) {
+            saveForward(v, load(itsRows.alphaStart + v * count));
+        }
+        // The first row's end columns are handed to the last row. Where it takes them up in this pass, they
+        // must be there; in a first pass, and with two rows, it still starts from what it had.
+        const unsigned lastRow = w.windows - 1;
+        const unsigned handBackAfter = first || lastRow < 1 ? lastRow : 1;
+        Window window = {0, 0, 0, w.windowStart[1], 0, slotWords};
+        runForward(window);
+        for (unsigned r = 0; r < w.windows; ++r) {
+            for (unsigned v = 0; v < vectors; ++v) {
+                const Window next = following(window);
+                runWindows<last>(window, next);
+                window = next;
+            }
+            if (r == handBackAfter) {
+                handBack();
+            }
+        }
+        handForward();
+    }
+
+private:
+    /// A window of one vector's lanes. Its slots follow each other upwards and downwards in turn: the
+    /// forward recursion of a window fills the slots that the backward recursion of the one before frees.
+    struct Window {
+        unsigned r;
+        unsigned v;
+        unsigned from;  ///< first step
+        unsigned to;    ///< after the last step; `from` when there is no such window
+        std::ptrdiff_t slot;
+        std::ptrdiff_t direction;
+
+        MORVIK_INLINE unsigned length() const
+        {
+            return to - from;
+        }
+
+        MORVIK_INLINE std::ptrdiff_t slotOf(unsigned step) const
+        {
+            return slot + direction * (static_cast<std::ptrdiff_t>(step) - static_cast<std::ptrdiff_t>(from));
+        }
+    };
+
+    /// The metrics of a slot: eight forward metrics, two branch metrics (the others are their doubles: LTE
+    /// has no second parity stream, rule 5) and the joint value.
+    static constexpr unsigned slotBranches = states * count;
+    static constexpr unsigned slotJoint = slotBranches + 2 * count;
+    static constexpr unsigned slotWords = slotJoint + count;
+
+    /// The window after `window` in the order of work.
+    MORVIK_INLINE Window following(const Window& window) const
+    {
+        const unsigned v = window.v + 1 == vectors ? 0 : window.v + 1;
+        const unsigned r = v == 0 ? window.r + 1 : window.r;
+        const std::ptrdiff_t slot = window.slotOf(window.to - 1);
+        if (r == w.windows) {
+            return {r, v, 0, 0, slot, -window.direction};
+        }
+        return {r, v, w.windowStart[r], w.windowStart[r + 1], slot, -window.direction};
+    }
+
+    MORVIK_INLINE void runForward(const Window& window) const
+    {
+        Column a = restoreForward(window.v);
+        forward(window, window.from, window.to, a);
+        saveForward(window.v, broughtBack(a));
+    }
+
+    /// The backward recursion of a window, together with the forward recursion of the next one: two
+    /// independent chains keep the processor's units busy where its registers suffice for both.
+    template <bool last>
+    MORVIK_INLINE void runWindows(const Window& window, const Window& next) const
+    {
+        const unsigned from = window.from;
+        const unsigned to = window.to;
+        const unsigned wrappingFrom = to == w.steps ? to - lanes::wrappingLastSteps : to;
+        const unsigned wrappingTo = from == 0 ? lanes::wrappingFirstSteps : from;
+        Column b = load(itsRows.betaStart + window.r * states * row + window.v * count);
+        backward<last, true>(window, wrappingFrom, to, b);
+        if constexpr (overlapped) {
+            const unsigned inBoth = least(wrappingFrom - wrappingTo, next.length());
+            Column a = next.length() != 0 ? restoreForward(next.v) : Column{};
+            both<last>(window, wrappingFrom, b, next, inBoth, a);
+            backward<last, false>(window, wrappingTo, wrappingFrom - inBoth, b);
+            backward<last, true>(window, from, wrappingTo, b);
+            forward(next, next.from + inBoth, next.to, a);
+            if (next.length() != 0) {
+                saveForward(next.v, broughtBack(a));
+            }
+        } else {
+            backward<last, false>(window, wrappingTo, wrappingFrom, b);
+            backward<last, true>(window, from, wrappingTo, b);
+            if (next.length() != 0) {
+                runForward(next);
+            }
+        }
+        storeReached(window, b);
+    }
+
+#if defined(__AVX512VL__) && defined(__x86_64__)
+    static constexpr bool overlapped = Rule::fewRegisters;
+#else
+    static constexpr bool overlapped = false;
+#endif
+
+    static MORVIK_INLINE unsigned least(unsigned a, unsigned b)
+    {
+        return a < b ? a : b;
+    }
+
+    MORVIK_INLINE void forward(const Window& window, unsigned from, unsigned to, Column& a) const
+    {
+        std::int16_t* slot = w.slots + window.slotOf(from);
+        for (unsigned k = from; k < to; ++k) {
+            forwardStep(k, window.v, slot, a);
+            slot += window.direction;
+        }
+    }
+
+    template <bool last, bool wrapping>
+    MORVIK_INLINE void backward(const Window& window, unsigned from, unsigned to, Column& b) const
+    {
+        const std::int16_t* slot = w.slots + window.slotOf(to);
+        for (unsigned k = to; k-- > from;) {
+            slot -= window.direction;
+            backwardStep<last, wrapping>(k, window.v, slot, b);
+        }
+    }
+
+    template <bool last>
+    MORVIK_INLINE void both(
+        const Window& window, unsigned to, Column& b, const Window& next, unsigned steps, Column& a) const
+    {
+        const std::int16_t* slot = w.slots + window.slotOf(to);
+        std::int16_t* nextSlot = w.slots + next.slot;
+        for (unsigned i = 0; i < steps; ++i) {
+            slot -= window.direction;
+            backwardStep<last, false>(to - 1 - i, window.v, slot, b);
+            forwardStep(next.from + i, next.v, nextSlot, a);
+            nextSlot += next.direction;
+        }
+    }
+
+    MORVIK_INLINE void forwardStep(unsigned k, unsigned v, std::int16_t* slot, Column& a) const
+    {
+        using Lanes = Permutation<count, vectors>;
+        const std::int16_t* source = itsJoint + itsRows.sourceRow[k] * row;
+        __builtin_prefetch(itsJoint + itsRows.sourceRow[k + lanes::fetchAhead] * row);
+        const Value joint = Lanes::load(source, itsRows.permutations + (k * vectors + v) * Lanes::bytes);
+        BranchMetrics g = trellis::branchSums(joint, Value::load(itsRows.parity + at(k, v)), Value{});
+        for (Value& metric : g) {
+            metric = clip(metric, lanes::branchMin, lanes::branchMax);
+        }
+        trellis::forEach<states>([&](auto state) { Decision::stored(a[state]).store(slot + state * count); });
+        g[0].store(slot + slotBranches);
+        g[1].store(slot + slotBranches + count);
+        joint.store(slot + slotJoint);
+        a = trellis::forwardStep(itsRule.decision(), a, g);
+    }
+
+    template <bool last, bool wrapping>
+    MORVIK_INLINE void backwardStep(unsigned k, unsigned v, const std::int16_t* slot, Column& b) const
+    {
+        const Value g0 = Value::load(slot + slotBranches);
+        const Value g1 = Value::load(slot + slotBranches + count);
+        const BranchMetrics g = {g0, g1, g1, g0};
+        Values alpha{};
+        Values beta{};
+        trellis::forEach<states>([&](auto state) {
+            alpha[state] = Value::load(slot + state * count);
+            beta[state] = Decision::stored(b[state]);
+        });
+        const auto c = trellis::candidates(itsRule.decision(), b, g);
+        const Value ratio = wrapping ? itsRule.wrapping(alpha, beta, g) : itsRule.ratio(alpha, beta, g, c);
+        if constexpr (last) {
+            ratio.store(w.ratios + at(k, v));
+        }
+        const Value joint = Value::load(slot + slotJoint);
+        nextJoint(ratio, joint, Value::load(itsRows.systematic + at(k, v))).store(itsRows.joint + at(k, v));
+        b = trellis::backwardStep(itsRule.decision(), c);
+    }
+
+    /// The extrinsic value x = ratio - 2 joint is scaled, rounded down to a step and clipped (rule 14), and
+    /// enters the other decoder halved, again rounded down (rule 13): all roundings fall into one.
+    static MORVIK_INLINE Value nextJoint(Value ratio, Value joint, Value systematic)
+    {
+        const Value x = ratio - (joint + joint);
+        const Value half = scaled ? threeEighths(x) : x >> 1;
+        return clip(half, lanes::branchMin / 2, lanes::branchMax / 2) + systematic;
+    }
+
+    static MORVIK_INLINE unsigned at(unsigned k, unsigned v)
+    {
+        return (k * vectors + v) * count;
+    }
+
+    MORVIK_INLINE Column load(const std::int16_t* column) const
+    {
+        Column m{};
+        trellis::forEach<states>([&](auto state) { m[state] = Decision::metric(Value::load(column + state * row)); });
+        return m;
+    }
+
+    MORVIK_INLINE void saveForward(unsigned v, const Column& a) const
+    {
+        std::memcpy(w.forward + v * sizeof a / 2, &a, sizeof a);
+    }
+
+    MORVIK_INLINE Column restoreForward(unsigned v) const
+    {
+        Column a{};
+        std::memcpy(&a, w.forward + v * sizeof a / 2, sizeof a);
+        return a;
+    }
+
+    /// A column with state 0 near 0, by a shift that border columns do not notice (Bounds.h).
+    static MORVIK_INLINE Column broughtBack(Column m)
+    {
+        const Value level = Decision::stored(m[0]) & Value::of(lanes::borderMask);
+        trellis::forEach<states>([&](auto state) { m[state] = Decision::subtract(m[state], level); });
+        return m;
+    }
+
+    /// Stores a border column (rule 11).
+    static MORVIK_INLINE void storeBorder(const Column& m, std::int16_t* column, unsigned stride)
+    {
+        trellis::forEach<states>([&](auto state) {
+            (Decision::stored(m[state]) & Value::of(lanes::borderMask)).store(column + state * stride);
+        });
+    }
+
+    MORVIK_INLINE std::int16_t* reached(unsigned direction, unsigned v) const
+    {
+        return w.reached + direction * states * wideRow + (v + 1) * count;
+    }
+
+    /// The column that a window reached is where the window before it starts next time; the first one's
+    /// belongs to the segment before, to its last window.
+    MORVIK_INLINE void storeReached(const Window& window, const Column& b) const
+    {
+        const Column m = broughtBack(b);
+        if (window.r == 0) {
+            storeBorder(m, reached(1, window.v), wideRow);
+        } else {
+            storeBorder(m, itsRows.betaStart + (window.r - 1) * states * row + window.v * count, row);
+        }
+    }
+
+    MORVIK_INLINE void handBack() const
+    {
+        std::int16_t* starts = itsRows.betaStart + (w.windows - 1) * states * row;
+        hand(reached(1, 0) + 1, starts, w.lastLanes);
+    }
+
+    MORVIK_INLINE void handForward() const
+    {
+        for (unsigned v = 0; v < vectors; ++v) {
+            storeBorder(restoreForward(v), reached(0, v), wideRow);
+        }
+        hand(reached(0, 0) - 1, itsRows.alphaStart, w.firstLanes);
+    }
+
+    /// Columns move to a neighbouring lane, but for the lanes at a block's border, which keep theirs.
+    MORVIK_INLINE void hand(const std::int16_t* from, std::int16_t* to, const std::int16_t* keep) const
+    {
+        for (unsigned state = 0; state < states; ++state) {
+            for (unsigned v = 0; v < vectors; ++v) {
+                const Value moved = Value::loadUnaligned(from + state * wideRow + v * count);
+                std::int16_t* start = to + state * row + v * count;
+                blend(Value::load(keep + v * count), moved, Value::load(start)).store(start);
+            }
+        }
+    }
+
+    const lanes::Workspace w;
+    const lanes::ConstituentRows itsRows;
+    const std::int16_t* itsJoint;
+    const Rule itsRule;
+};
+
+template <class Rule, unsigned vectors, bool scaled, bool last>
+__attribute__((flatten, noinline)) void runPass(const lanes::Workspace& workspace,
+                                                unsigned d,
+                                                const std::int16_t* joint,
+                                                bool first)
+{
+    Pass<Rule, vectors, scaled>(workspace, d, joint).template run<last>(first);
+}
+
+}  // namespace MORVIK_LANES
+
+#endif

@@ -1,0 +1,177 @@
+// Permute: the steps that move values between lanes or look them up, as each instruction set does them best.
+#ifndef MORVIK_LANES_PERMUTE_H
+#define MORVIK_LANES_PERMUTE_H
+
+#include "../src/Trellis.h"
+#include "Words.h"
+
+namespace MORVIK_LANES {
+
+// A permutation of the lanes of a row of `vectors` vectors is prepared as a control of `bytes` bytes for each
+// vector of the result; lane l of that vector takes the row's lane source[l].
+
+#if defined(__AVX512BW__) && defined(__AVX512VL__)
+
+/// An index word for each lane.
+template <unsigned count, unsigned vectors>
+struct Permutation {
+    static_assert(vectors == 1);
+    static constexpr unsigned bytes = 2 * count;
+
+    static void prepare(const std::uint8_t* source, std::uint8_t* control)
+    {
+        for (unsigned lane = 0; lane < count; ++lane) {
+            control[2 * lane] = source[lane];
+            control[2 * lane + 1] = 0;
+        }
+    }
+
+    static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
+    {
+        typename Steps<count>::Vector index;
+        std::memcpy(&index, control, sizeof index);
+        return permute(Steps<count>::load(row), index);
+    }
+
+private:
+    static MORVIK_INLINE Steps<8> permute(Steps<8> a, Steps<8>::Vector index)
+    {
+        return {(Steps<8>::Vector)_mm_permutexvar_epi16((__m128i)index, (__m128i)a.v)};
+    }
+
+    static MORVIK_INLINE Steps<16> permute(Steps<16> a, Steps<16>::Vector index)
+    {
+        return {(Steps<16>::Vector)_mm256_permutexvar_epi16((__m256i)index, (__m256i)a.v)};
+    }
+
+    static MORVIK_INLINE Steps<32> permute(Steps<32> a, Steps<32>::Vector index)
+    {
+        return {(Steps<32>::Vector)_mm512_permutexvar_epi16((__m512i)index, (__m512i)a.v)};
+    }
+};
+
+#elif defined(__SSSE3__)
+
+/// A byte shuffle for each sixteen bytes of the row; those that take nothing from them give zeros.
+template <unsigned count, unsigned vectors>
+struct Permutation {
+    static constexpr unsigned pieces = vectors * count / 8;
+    static constexpr unsigned bytes = pieces * 2 * count;
+
+    static void prepare(const std::uint8_t* source, std::uint8_t* control)
+    {
+        for (unsigned piece = 0; piece < pieces; ++piece) {
+            for (unsigned lane = 0; lane < count; ++lane) {
+                const unsigned from = 2U * source[lane] - 16 * piece;
+                *control++ = static_cast<std::uint8_t>(from < 16 ? from : 0x80);
+                *control++ = static_cast<std::uint8_t>(from < 16 ? from + 1 : 0x80);
+            }
+        }
+    }
+
+    static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
+    {
+        Steps<count> result = shuffle(row, control);
+        trellis::forEach<pieces - 1>(
+            [&](auto piece) { result.v |= shuffle(row + 8 * (piece + 1), control + (piece + 1) * 2 * count).v; });
+        return result;
+    }
+
+private:
+    static MORVIK_INLINE Steps<count> shuffle(const std::int16_t* piece, const std::uint8_t* control)
+    {
+        const __m128i words = _mm_load_si128(reinterpret_cast<const __m128i*>(piece));
+        const void* const select = control;
+        if constexpr (count == 8) {
+            return {(Steps<8>::Vector)_mm_shuffle_epi8(words, _mm_load_si128(static_cast<const __m128i*>(select)))};
+        } else {
+#if defined(__AVX2__)
+            return {(Steps<16>::Vector)_mm256_shuffle_epi8(_mm256_broadcastsi128_si256(words),
+                                                           _mm256_load_si256(static_cast<const __m256i*>(select)))};
+#endif
+        }
+    }
+};
+
+#else
+
+/// The source lanes themselves.
+template <unsigned count, unsigned vectors>
+struct Permutation {
+    static constexpr unsigned bytes = count;
+
+    static void prepare(const std::uint8_t* source, std::uint8_t* control)
+    {
+        std::memcpy(control, source, count);
+    }
+
+    static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
+    {
+        Steps<count> result{};
+        for (unsigned lane = 0; lane < count; ++lane) {
+            result.v[lane] = row[control[lane]];
+        }
+        return result;
+    }
+};
+
+#endif
+
+/// A table of sixteen small values, looked up in each lane.
+template <unsigned count>
+class Table {
+public:
+#if defined(__SSSE3__)
+    explicit MORVIK_INLINE Table(const std::uint8_t* entries)
+    {
+        for (unsigned i = 0; i < sizeof itsBytes; ++i) {
+            reinterpret_cast<std::uint8_t*>(&itsBytes)[i] = entries[i % 16];
+        }
+    }
+
+    /// The entries at `index`, 0 to 15. A byte shuffle gives 0 where the index byte's sign bit is set: the
+    /// upper byte's.
+    MORVIK_INLINE Steps<count> at(Steps<count> index) const
+    {
+        return shuffle(index | Steps<count>::of(-0x8000));
+    }
+
+private:
+    typename Steps<count>::Vector itsBytes;
+
+    MORVIK_INLINE Steps<count> shuffle(Steps<count> control) const
+    {
+        using Vector = typename Steps<count>::Vector;
+        if constexpr (count == 8) {
+            return {(Vector)_mm_shuffle_epi8((__m128i)itsBytes, (__m128i)control.v)};
+#if defined(__AVX2__)
+        } else if constexpr (count == 16) {
+            return {(Vector)_mm256_shuffle_epi8((__m256i)itsBytes, (__m256i)control.v)};
+#endif
+#if defined(__AVX512BW__)
+        } else {
+            return {(Vector)_mm512_shuffle_epi8((__m512i)itsBytes, (__m512i)control.v)};
+#endif
+        }
+    }
+#else
+    explicit MORVIK_INLINE Table(const std::uint8_t* entries) : itsEntries(entries) {}
+
+    /// The entries at `index`, 0 to 15.
+    MORVIK_INLINE Steps<count> at(Steps<count> index) const
+    {
+        Steps<count> result{};
+        for (unsigned lane = 0; lane < count; ++lane) {
+            result.v[lane] = itsEntries[index.v[lane]];
+        }
+        return result;
+    }
+
+private:
+    const std::uint8_t* itsEntries;
+#endif
+};
+
+}  // namespace MORVIK_LANES
+
+#endif

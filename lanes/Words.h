@@ -1,0 +1,202 @@
+// Words: vectors of 16-bit words, the value types over which the lanes run the trellis.
+//
+// Two readings of the same vector. `Steps` holds whole steps of the formats, which is an aligned word
+// divided by 16, and is never wrapped: four spare bits let a plain maximum decide (Bounds.h proves it).
+// `Aligned` holds left-aligned words that wrap as the hardware's registers do.
+//
+// This text is compiled once for each instruction set, in a namespace of its own, MORVIK_LANES, so that
+// nothing that is compiled for one can serve another.
+#ifndef MORVIK_LANES_WORDS_H
+#define MORVIK_LANES_WORDS_H
+
+#include <cstdint>
+#include <cstring>
+
+#if defined(__SSE2__)
+#include <immintrin.h>
+#endif
+
+#define MORVIK_INLINE inline __attribute__((always_inline))
+
+namespace MORVIK_LANES {
+
+template <unsigned count>
+struct Raw {
+    typedef std::int16_t Signed __attribute__((vector_size(2 * count)));
+    typedef std::uint16_t Unsigned __attribute__((vector_size(2 * count)));
+};
+
+/// Whole steps, in each of `count` lanes. No operation leaves 16 bits.
+template <unsigned count>
+struct Steps {
+    using Vector = typename Raw<count>::Signed;
+
+    Vector v;
+
+    static MORVIK_INLINE Steps of(int value)
+    {
+        return {Vector{} + static_cast<std::int16_t>(value)};
+    }
+
+    /// From an address that is a multiple of the vector's size.
+    static MORVIK_INLINE Steps load(const std::int16_t* from)
+    {
+        Vector v;
+        std::memcpy(&v, __builtin_assume_aligned(from, sizeof v), sizeof v);
+        return {v};
+    }
+
+    static MORVIK_INLINE Steps loadUnaligned(const std::int16_t* from)
+    {
+        Vector v;
+        std::memcpy(&v, from, sizeof v);
+        return {v};
+    }
+
+    MORVIK_INLINE void store(std::int16_t* to) const
+    {
+        std::memcpy(__builtin_assume_aligned(to, sizeof v), &v, sizeof v);
+    }
+
+    friend MORVIK_INLINE Steps operator+(Steps a, Steps b)
+    {
+        return {a.v + b.v};
+    }
+
+    friend MORVIK_INLINE Steps operator-(Steps a, Steps b)
+    {
+        return {a.v - b.v};
+    }
+
+    friend MORVIK_INLINE Steps operator&(Steps a, Steps b)
+    {
+        return {a.v & b.v};
+    }
+
+    friend MORVIK_INLINE Steps operator|(Steps a, Steps b)
+    {
+        return {a.v | b.v};
+    }
+
+    friend MORVIK_INLINE Steps operator^(Steps a, Steps b)
+    {
+        return {a.v ^ b.v};
+    }
+
+    /// Divided by 2^bits, rounded down.
+    friend MORVIK_INLINE Steps operator>>(Steps a, int bits)
+    {
+        return {a.v >> bits};
+    }
+
+    friend MORVIK_INLINE Steps max(Steps a, Steps b)
+    {
+        return {a.v > b.v ? a.v : b.v};
+    }
+
+    friend MORVIK_INLINE Steps min(Steps a, Steps b)
+    {
+        return {a.v < b.v ? a.v : b.v};
+    }
+
+    friend MORVIK_INLINE Steps clip(Steps a, int lo, int hi)
+    {
+        return max(min(a, of(hi)), of(lo));
+    }
+
+    /// b where mask is all ones, a where it is 0.
+    friend MORVIK_INLINE Steps blend(Steps mask, Steps a, Steps b)
+    {
+        return {(a.v & ~mask.v) | (b.v & mask.v)};
+    }
+
+    friend MORVIK_INLINE Steps addWrap(Steps a, Steps b)
+    {
+        return a + b;
+    }
+
+    friend MORVIK_INLINE Steps subWrap(Steps a, Steps b)
+    {
+        return a - b;
+    }
+
+    friend MORVIK_INLINE Steps select(Steps difference, Steps c1, Steps c2)
+    {
+        return {difference.v < 0 ? c2.v : c1.v};
+    }
+
+    friend MORVIK_INLINE Steps maxWrap(Steps c1, Steps c2)
+    {
+        return max(c1, c2);
+    }
+};
+
+/// Left-aligned words, in each of `count` lanes, that wrap modulo 2^16.
+template <unsigned count>
+struct Aligned {
+    using Signed = typename Raw<count>::Signed;
+    using Unsigned = typename Raw<count>::Unsigned;
+
+    Unsigned v = {};
+
+    Aligned() = default;
+    explicit MORVIK_INLINE Aligned(Unsigned words) : v(words) {}
+    explicit MORVIK_INLINE Aligned(Steps<count> steps) : v(reinterpret_cast<Unsigned>(steps.v) << 4) {}
+
+    MORVIK_INLINE Signed word() const
+    {
+        return reinterpret_cast<Signed>(v);
+    }
+
+    /// The steps of the wrapped word: -2048 to 2047.
+    MORVIK_INLINE Steps<count> steps() const
+    {
+        return {word() >> 4};
+    }
+
+    friend MORVIK_INLINE Aligned addWrap(Aligned a, Aligned b)
+    {
+        return Aligned(a.v + b.v);
+    }
+
+    friend MORVIK_INLINE Aligned subWrap(Aligned a, Aligned b)
+    {
+        return Aligned(a.v - b.v);
+    }
+
+    friend MORVIK_INLINE Aligned select(Aligned difference, Aligned c1, Aligned c2)
+    {
+        return Aligned(reinterpret_cast<Signed>(difference.v) < 0 ? c2.v : c1.v);
+    }
+
+    friend MORVIK_INLINE Aligned maxWrap(Aligned c1, Aligned c2)
+    {
+        return select(subWrap(c1, c2), c1, c2);
+    }
+};
+
+/// floor(3 a / 8), for any a whose threefold fits 17 bits.
+template <unsigned count>
+MORVIK_INLINE Steps<count> threeEighths(Steps<count> a)
+{
+#if defined(__AVX512BW__)
+    if constexpr (count == 32) {
+        return {(typename Steps<count>::Vector)_mm512_mulhi_epi16((__m512i)a.v, _mm512_set1_epi16(3 << 13))};
+    }
+#endif
+#if defined(__AVX2__)
+    if constexpr (count == 16) {
+        return {(typename Steps<count>::Vector)_mm256_mulhi_epi16((__m256i)a.v, _mm256_set1_epi16(3 << 13))};
+    }
+#endif
+#if defined(__SSE2__)
+    if constexpr (count == 8) {
+        return {(typename Steps<count>::Vector)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(3 << 13))};
+    }
+#endif
+    return (a + a + a) >> 3;
+}
+
+}  // namespace MORVIK_LANES
+
+#endif

@@ -1,0 +1,81 @@
+// SimulationCall: what the simulation calls of the two C headers share.
+#ifndef MORVIK_SIMULATIONCALL_H
+#define MORVIK_SIMULATIONCALL_H
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "../lanes/LaneDecoder.h"
+#include "DecoderState.h"
+
+namespace simulation_call {
+
+using State = veltra_ip_morvik_v1_0_state;
+
+enum Status : std::int32_t { success = 0, refused = 1, decodeFailed = 2, exceptionRaised = 99 };
+
+/// Writes the line of a refusal.
+Status refuse(const char* reason);
+
+/// What is wrong with the arguments of a call, or null. `delivers` is whether there is an output record,
+/// `dout` its array.
+template <class Input>
+const char* checkArguments(const State* state,
+                           bool delivers,
+                           const std::uint8_t* dout,
+                           const lanes::Streams<Input>& streams,
+                           std::int32_t dinSize,
+                           std::uint32_t iterations)
+{
+    if (state == nullptr) {
+        return "Simulate called with null state structure";
+    }
+    if (!delivers) {
+        return "Simulate called with null output structure";
+    }
+    if (dout == nullptr) {
+        return "Simulate called with null pointer for dout";
+    }
+    if (dinSize < 1) {
+        return "din_size must be a positive integer";
+    }
+    if (streams.systematic == nullptr) {
+        return "rsc1_sys must not be a null pointer";
+    }
+    if (streams.parity1 == nullptr) {
+        return "rsc1_par must not be a null pointer";
+    }
+    if (streams.parity2 == nullptr) {
+        return "rsc2_par must not be a null pointer";
+    }
+    if (iterations < 1 || iterations > 15) {
+        return "Number of iterations must be in the range 1 to 15";
+    }
+    return nullptr;
+}
+
+/// The tag's bits that the core carries. The first tag of a state's life that loses bits is reported.
+std::uint32_t truncateTag(State& state, std::uint32_t tag);
+
+/// A block through the components: joins the three streams, position by position, into aligned soft
+/// values, reporting the first of a state's life that has to be clipped, and decodes them.
+template <class Input>
+Status decodeByComponents(State& state,
+                          const lanes::Streams<Input>& streams,
+                          std::int32_t dinSize,
+                          std::uint32_t iterations,
+                          std::vector<unsigned char>& hard);
+
+/// Whether the lanes decode a block of dinSize positions for this state: nobody watches its columns.
+bool lanesTake(const State& state, std::int32_t dinSize);
+
+/// Takes as many of the blocks into the lanes as they like, with the same report; returns how many. Tags
+/// of the blocks before the reported one, when there are any, are reported before it.
+template <class Input>
+unsigned loadLanes(
+    State& state, const lanes::Streams<Input>* blocks, unsigned count, std::int32_t dinSize, const std::uint32_t* tags);
+
+}  // namespace simulation_call
+
+#endif

@@ -1,0 +1,21 @@
+#!/usr/bin/env bash
+# Compiles the digest and the whole model with one compiler, for one word size, at one level of optimisation.
+#   build_digest.sh COMPILER WORD LEVEL PROGRAM        build_digest.sh g++ -m32 -O0 build/digest
+set -euo pipefail
+compile=("$1" -std=c++17 "$2" -msse2 -mfpmath=sse "$3")
+program=$4
+tests=$(cd "$(dirname "$0")" && pwd)
+root=$(dirname "$tests")
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+
+kernels() {
+    "${compile[@]}" "${@:2}" -DMORVIK_LANES="lanes_$1" -DMORVIK_LANES_NAME="\"$1\"" \
+        -c "$root/lanes/Kernels.cpp" -o "$work/$1.o"
+}
+kernels generic
+kernels ssse3 -mssse3
+kernels avx2 -mavx2
+kernels avx512 -mavx512f -mavx512bw -mavx512vl
+"${compile[@]}" -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp "$root/lanes/InstructionSets.cpp" \
+    "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/digest.cpp" "$work"/*.o -o "$program"
