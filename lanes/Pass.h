@@ -193,7 +193,8 @@ private:
         for (Value& metric : g) {
             metric = clip(metric, lanes::branchMin, lanes::branchMax);
         }
-        trellis::forEach<states>([&](auto state) { Decision::stored(a[state]).store(slot + state * count); });
+        trellis::forEach<states>([&](auto state)
+                                     MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * count); });
         g[0].store(slot + slotBranches);
         g[1].store(slot + slotBranches + count);
         joint.store(slot + slotJoint);
@@ -208,7 +209,7 @@ private:
         const BranchMetrics g = {g0, g1, g1, g0};
         Values alpha{};
         Values beta{};
-        trellis::forEach<states>([&](auto state) {
+        trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
             alpha[state] = Value::load(slot + state * count);
             beta[state] = Decision::stored(b[state]);
         });
@@ -239,7 +240,8 @@ private:
     MORVIK_INLINE Column load(const std::int16_t* column) const
     {
         Column m{};
-        trellis::forEach<states>([&](auto state) { m[state] = Decision::metric(Value::load(column + state * row)); });
+        trellis::forEach<states>(
+            [&](auto state) MORVIK_INLINE_LAMBDA { m[state] = Decision::metric(Value::load(column + state * row)); });
         return m;
     }
 
@@ -259,14 +261,15 @@ private:
     static MORVIK_INLINE Column broughtBack(Column m)
     {
         const Value level = Decision::stored(m[0]) & Value::of(lanes::borderMask);
-        trellis::forEach<states>([&](auto state) { m[state] = Decision::subtract(m[state], level); });
+        trellis::forEach<states>([&](auto state)
+                                     MORVIK_INLINE_LAMBDA { m[state] = Decision::subtract(m[state], level); });
         return m;
     }
 
     /// Stores a border column (rule 11).
     static MORVIK_INLINE void storeBorder(const Column& m, std::int16_t* column, unsigned stride)
     {
-        trellis::forEach<states>([&](auto state) {
+        trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
             (Decision::stored(m[state]) & Value::of(lanes::borderMask)).store(column + state * stride);
         });
     }

@@ -72,8 +72,9 @@ struct Permutation {
     static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
     {
         Steps<count> result = shuffle(row, control);
-        trellis::forEach<pieces - 1>(
-            [&](auto piece) { result.v |= shuffle(row + 8 * (piece + 1), control + (piece + 1) * 2 * count).v; });
+        trellis::forEach<pieces - 1>([&](auto piece) MORVIK_INLINE_LAMBDA {
+            result.v |= shuffle(row + 8 * (piece + 1), control + (piece + 1) * 2 * count).v;
+        });
         return result;
     }
 

@@ -26,11 +26,11 @@ MORVIK_INLINE Steps<count> wrappingRatio(const Decision& rule,
     std::array<Word, trellis::stateCount> alignedA{};
     std::array<Word, trellis::stateCount> alignedB{};
     trellis::BranchMetrics<Word> alignedG{};
-    trellis::forEach<trellis::stateCount>([&](auto state) {
+    trellis::forEach<trellis::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
         alignedA[state] = Word(a[state]);
         alignedB[state] = Word(b[state]);
     });
-    trellis::forEach<4>([&](auto i) { alignedG[i] = Word(g[i]); });
+    trellis::forEach<4>([&](auto i) MORVIK_INLINE_LAMBDA { alignedG[i] = Word(g[i]); });
     return trellis::logLikelihoodRatio(rule, alignedA, alignedB, alignedG).steps();
 }
 

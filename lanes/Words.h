@@ -12,11 +12,11 @@
 #include <cstdint>
 #include <cstring>
 
+#include "../src/Arithmetic.h"
+
 #if defined(__SSE2__)
 #include <immintrin.h>
 #endif
-
-#define MORVIK_INLINE inline __attribute__((always_inline))
 
 namespace MORVIK_LANES {
 

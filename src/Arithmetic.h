@@ -7,6 +7,15 @@
 
 #include <cstdint>
 
+/// The steps over the trellis are short and run millions of times: no call may be left of them.
+#if defined(__GNUC__)
+#define MORVIK_INLINE inline __attribute__((always_inline))
+#define MORVIK_INLINE_LAMBDA __attribute__((always_inline))
+#else
+#define MORVIK_INLINE inline
+#define MORVIK_INLINE_LAMBDA
+#endif
+
 namespace arithmetic {
 
 /// A soft value or metric: a signed 16-bit word, left-aligned in its format (rule 1).

@@ -53,14 +53,14 @@ constexpr unsigned branch(unsigned state)
 }
 
 template <class Step, unsigned... index>
-constexpr void unrolled([[maybe_unused]] Step step, std::integer_sequence<unsigned, index...>)
+MORVIK_INLINE constexpr void unrolled([[maybe_unused]] Step step, std::integer_sequence<unsigned, index...>)
 {
     (step(std::integral_constant<unsigned, index>{}), ...);
 }
 
 /// Calls step(0) to step(count - 1) with indices that are constants, so that columns stay in registers.
 template <unsigned count, class Step>
-constexpr void forEach([[maybe_unused]] Step step)
+MORVIK_INLINE constexpr void forEach([[maybe_unused]] Step step)
 {
     unrolled(step, std::make_integer_sequence<unsigned, count>{});
 }
@@ -73,7 +73,7 @@ using Column = std::array<typename Decision::Metric, stateCount>;
 
 /// The four branch metrics of a step before they are clipped: 2 i +- p +- q (rule 5).
 template <class Wide>
-constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide parity0, Wide parity1)
+MORVIK_INLINE constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide parity0, Wide parity1)
 {
     return {twiceIntrinsic + parity0 + parity1,
             twiceIntrinsic - parity0 + parity1,
@@ -84,10 +84,12 @@ constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide parity0, Wide
 /// Forward: the column after a step, each state decided between its two predecessors, the one on bit 1
 /// first (rule 6).
 template <class Decision, class Value>
-constexpr Column<Decision> forwardStep(const Decision& rule, const Column<Decision>& a, const BranchMetrics<Value>& g)
+MORVIK_INLINE constexpr Column<Decision> forwardStep(const Decision& rule,
+                                                     const Column<Decision>& a,
+                                                     const BranchMetrics<Value>& g)
 {
     Column<Decision> next{};
-    forEach<stateCount>([&](auto state) {
+    forEach<stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
         constexpr unsigned one = predecessor(state, 1);
         constexpr unsigned zero = predecessor(state, 0);
         constexpr unsigned pair = branch(one);  // the two are one
@@ -104,12 +106,12 @@ struct Candidates {
 };
 
 template <class Decision, class Value>
-constexpr Candidates<Decision> candidates(const Decision& rule,
-                                          const Column<Decision>& b,
-                                          const BranchMetrics<Value>& g)
+MORVIK_INLINE constexpr Candidates<Decision> candidates(const Decision& rule,
+                                                        const Column<Decision>& b,
+                                                        const BranchMetrics<Value>& g)
 {
     Candidates<Decision> c{};
-    forEach<stateCount>([&](auto state) {
+    forEach<stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
         constexpr unsigned afterOne = successor(state, 1);
         constexpr unsigned afterZero = successor(state, 0);
         constexpr unsigned pair = branch(state);
@@ -122,10 +124,11 @@ constexpr Candidates<Decision> candidates(const Decision& rule,
 /// Backward: the column before a step, each state decided between its two successors, the one on bit 1
 /// first (rule 6).
 template <class Decision>
-constexpr Column<Decision> backwardStep(const Decision& rule, const Candidates<Decision>& c)
+MORVIK_INLINE constexpr Column<Decision> backwardStep(const Decision& rule, const Candidates<Decision>& c)
 {
     Column<Decision> previous{};
-    forEach<stateCount>([&](auto state) { previous[state] = rule.decide(c.one[state], c.zero[state]); });
+    forEach<stateCount>([&](auto state)
+                            MORVIK_INLINE_LAMBDA { previous[state] = rule.decide(c.one[state], c.zero[state]); });
     return previous;
 }
 
@@ -133,13 +136,13 @@ constexpr Column<Decision> backwardStep(const Decision& rule, const Candidates<D
 /// share a branch metric, so they are decided first, the odd one being the first candidate, then
 /// pairs, then halves (rule 8).
 template <unsigned bit, class Decision, class Value>
-constexpr Value bestPath(const Decision& rule,
-                         const std::array<Value, stateCount>& a,
-                         const std::array<Value, stateCount>& b,
-                         const BranchMetrics<Value>& g)
+MORVIK_INLINE constexpr Value bestPath(const Decision& rule,
+                                       const std::array<Value, stateCount>& a,
+                                       const std::array<Value, stateCount>& b,
+                                       const BranchMetrics<Value>& g)
 {
     std::array<typename Decision::Metric, 4> pair{};
-    forEach<4>([&](auto i) {
+    forEach<4>([&](auto i) MORVIK_INLINE_LAMBDA {
         constexpr unsigned odd = 2 * i + 1;
         constexpr unsigned even = 2 * i;
         constexpr unsigned afterOdd = successor(odd, bit);
@@ -153,10 +156,10 @@ constexpr Value bestPath(const Decision& rule,
 
 /// The log-likelihood ratio of a step; positive favours bit 1. It wraps like the metrics (rule 8).
 template <class Decision, class Value>
-constexpr Value logLikelihoodRatio(const Decision& rule,
-                                   const std::array<Value, stateCount>& a,
-                                   const std::array<Value, stateCount>& b,
-                                   const BranchMetrics<Value>& g)
+MORVIK_INLINE constexpr Value logLikelihoodRatio(const Decision& rule,
+                                                 const std::array<Value, stateCount>& a,
+                                                 const std::array<Value, stateCount>& b,
+                                                 const BranchMetrics<Value>& g)
 {
     return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));
 }

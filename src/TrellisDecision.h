@@ -20,27 +20,27 @@ template <class Value>
 struct PlainMetrics {
     using Metric = Value;
 
-    static constexpr Metric metric(Value value)
+    MORVIK_INLINE static constexpr Metric metric(Value value)
     {
         return value;
     }
 
-    static constexpr Metric add(Metric m, Value g)
+    MORVIK_INLINE static constexpr Metric add(Metric m, Value g)
     {
         return addWrap(m, g);
     }
 
-    static constexpr Metric subtract(Metric m, Value g)
+    MORVIK_INLINE static constexpr Metric subtract(Metric m, Value g)
     {
         return subWrap(m, g);
     }
 
-    static constexpr Value stored(Metric m)
+    MORVIK_INLINE static constexpr Value stored(Metric m)
     {
         return m;
     }
 
-    static constexpr Value settled(Metric m)
+    MORVIK_INLINE static constexpr Value settled(Metric m)
     {
         return m;
     }
@@ -49,7 +49,7 @@ struct PlainMetrics {
 /// "MOD": the greater candidate, max-log-MAP.
 template <class Value>
 struct DecideMax : PlainMetrics<Value> {
-    static constexpr Value decide(Value c1, Value c2)
+    MORVIK_INLINE static constexpr Value decide(Value c1, Value c2)
     {
         return maxWrap(c1, c2);
     }
@@ -62,7 +62,7 @@ struct DecideMaxStar : PlainMetrics<Value> {
 
     explicit constexpr DecideMaxStar(Table corrections) : table(corrections) {}
 
-    constexpr Value decide(Value c1, Value c2) const
+    MORVIK_INLINE constexpr Value decide(Value c1, Value c2) const
     {
         return addWrap(maxWrap(c1, c2), table(subWrap(c1, c2)));
     }
@@ -86,22 +86,22 @@ struct DecideMaxHash {
 
     explicit constexpr DecideMaxHash(Table corrections) : table(corrections) {}
 
-    static constexpr Metric metric(Value value)
+    MORVIK_INLINE static constexpr Metric metric(Value value)
     {
         return {value, Value{}};
     }
 
-    static constexpr Metric add(Metric m, Value g)
+    MORVIK_INLINE static constexpr Metric add(Metric m, Value g)
     {
         return {addWrap(m.value, g), m.pending};
     }
 
-    static constexpr Metric subtract(Metric m, Value g)
+    MORVIK_INLINE static constexpr Metric subtract(Metric m, Value g)
     {
         return {subWrap(m.value, g), m.pending};
     }
 
-    constexpr Metric decide(Metric c1, Metric c2) const
+    MORVIK_INLINE constexpr Metric decide(Metric c1, Metric c2) const
     {
         const Value difference = subWrap(c1.value, c2.value);
         const Value winner = select(difference, c1.value, c2.value);
@@ -109,12 +109,12 @@ struct DecideMaxHash {
         return {addWrap(winner, pending), table(difference)};
     }
 
-    static constexpr Value stored(Metric m)
+    MORVIK_INLINE static constexpr Value stored(Metric m)
     {
         return m.value;
     }
 
-    static constexpr Value settled(Metric m)
+    MORVIK_INLINE static constexpr Value settled(Metric m)
     {
         return addWrap(m.value, m.pending);
     }
