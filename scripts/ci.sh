@@ -70,20 +70,23 @@ stage_threads() {
     build/threads/tests/threads_test --gtest_brief=1
 }
 
-# Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead.
+# Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead;
+# FUZZ_CORPUS names a folder that keeps what long runs find, and where the next run goes on.
 stage_fuzz() {
     local fuzzers=(csv_fuzz property_strings_fuzz simulate_fuzz state_fuzz text_fuzz)
     scripts/build fuzz "${fuzzers[@]}"
-    local fuzzer work
-    work=$(mktemp -d)
-    trap 'rm -rf "$work"' RETURN
+    local fuzzer log=build/fuzz/log corpus=${FUZZ_CORPUS:-}
+    if [ -z "$corpus" ]; then
+        corpus=$(mktemp -d)
+        trap 'rm -rf "$corpus"; trap - RETURN' RETURN
+    fi
     for fuzzer in "${fuzzers[@]}"; do
         local limit=(-runs=2000)
         [ -z "${FUZZ_SECONDS:-}" ] || limit=(-max_total_time="$FUZZ_SECONDS")
-        mkdir "$work/$fuzzer"
+        mkdir -p "$corpus/$fuzzer"
         "build/fuzz/tests/$fuzzer" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/fuzz/" \
-            "$work/$fuzzer" "tests/fuzz/corpus/$fuzzer" >"$work/log" 2>&1 || { tail -n 60 "$work/log"; return 1; }
-        echo "$fuzzer: $(sed -n 's/.*number_of_executed_units: *//p' "$work/log") executions"
+            "$corpus/$fuzzer" "tests/fuzz/corpus/$fuzzer" >"$log" 2>&1 || { tail -n 60 "$log"; return 1; }
+        echo "$fuzzer: $(sed -n 's/.*number_of_executed_units: *//p' "$log") executions"
     done
 }
 
