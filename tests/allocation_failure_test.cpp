@@ -24,12 +24,14 @@
 #include "Misc.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
+// NOLINTBEGIN(bugprone-reserved-identifier): the linker chooses these names.
 extern "C" {
 void* __real_malloc(std::size_t size);
 void __real_free(void* memory);
 void* __wrap_malloc(std::size_t size);
 void __wrap_free(void* memory);
 }
+// NOLINTEND(bugprone-reserved-identifier)
 
 namespace {
 

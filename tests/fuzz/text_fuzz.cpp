@@ -108,8 +108,8 @@ void split(const std::string& text, const std::string& delimiters, const std::st
     }
     require(characters <= text.size() + 1, "tokens and the delimiters between them are parts of the text");
 
-    const std::string set = delimiters.c_str();
-    const auto [head, tail] = splitString(text, delimiters.c_str());
+    const std::string set = delimiters.substr(0, delimiters.find('\0'));
+    const auto [head, tail] = splitString(text, set.c_str());
     require(head.find_first_of(set) == std::string::npos, "there is no delimiter before the first");
     const bool found = head.size() < text.size();
     require(found ? set.find(text[head.size()]) != std::string::npos && tail == text.substr(head.size() + 1)
