@@ -134,13 +134,13 @@ const char* checkArguments(const State* state,
     return nullptr;
 }
 
-/// A caller's value in the state format, clipped to the input format (rule 4). `saturated` is set
-/// to -1 or 1 when it was clipped, to 0 otherwise.
-short convertInput(std::int32_t value, const TNumberFormat& input, const TNumberFormat& state, int& saturated)
+/// A caller's value in the state format, clipped to the input format (rule 4). `excess` is set to what
+/// was clipped: 0, or a number of the sign of the limit that was exceeded.
+short convertInput(std::int32_t value, const TNumberFormat& input, const TNumberFormat& state, std::int32_t& excess)
 {
     const std::int32_t aligned = arithmetic::shiftLeftWrap(value, input.itsShift);
     const std::int32_t clipped = arithmetic::clip<std::int32_t>(aligned, input.itsMin, input.itsMax);
-    saturated = clipped < aligned ? 1 : (clipped > aligned ? -1 : 0);
+    excess = aligned - clipped;
     return state.place(input.integer(arithmetic::wrap16(clipped)));
 }
 
@@ -153,14 +153,14 @@ std::vector<short> convertInputs(State& state, const std::int32_t* const (&strea
     soft.reserve(3 * static_cast<std::size_t>(dinSize));
     for (std::int32_t i = 0; i < dinSize; ++i) {
         for (unsigned s = 0; s < 3; ++s) {
-            int saturated = 0;
-            soft.push_back(convertInput(streams[s][i], *state.input_format, *state.state_format, saturated));
-            if (saturated != 0 && !state.saturation_reported) {
+            std::int32_t excess = 0;
+            soft.push_back(convertInput(streams[s][i], *state.input_format, *state.state_format, excess));
+            if (excess != 0 && !state.saturation_reported) {
                 messages::writeWarning("WARNING:decoder:",
                                        streamNames[s],
                                        " value in position ",
                                        i,
-                                       saturated > 0 ? " saturated positively" : " saturated negatively",
+                                       excess > 0 ? " saturated positively" : " saturated negatively",
                                        ", further saturation will not be reported");
                 state.saturation_reported = true;
             }
