@@ -16,15 +16,21 @@ stage_format() {
 
 stage_lint() {
     scripts/build x86_64
-    git ls-files 'src/*.cpp' 'app/*.cpp' | xargs -P "$(nproc)" -n 1 clang-tidy -p build/x86_64 --quiet 2>/dev/null
+    # On the standard error stream it counts what it suppresses, and says why it could not run.
+    local log=build/x86_64/lint.log
+    git ls-files 'src/*.cpp' 'app/*.cpp' 'tests/*.cpp' |
+        xargs -P "$(nproc)" -n 1 clang-tidy -p build/x86_64 --quiet 2>"$log" || { cat "$log" >&2; return 1; }
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
         --suppress=internalAstError -I include -I src src app
 }
 
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.
 stage_compilers() {
-    scripts/build clang
-    scripts/run-tests clang
+    local preset
+    for preset in clang clang-32; do
+        scripts/build "$preset"
+        scripts/run-tests "$preset"
+    done
 }
 
 # The binary interface against the committed one, which is kept compressed.
@@ -70,20 +76,23 @@ stage_threads() {
     build/threads/tests/threads_test --gtest_brief=1
 }
 
-# Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead.
+# Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead;
+# FUZZ_CORPUS names a folder that keeps what long runs find, and where the next run goes on.
 stage_fuzz() {
     local fuzzers=(csv_fuzz property_strings_fuzz simulate_fuzz state_fuzz text_fuzz)
     scripts/build fuzz "${fuzzers[@]}"
-    local fuzzer work
-    work=$(mktemp -d)
-    trap 'rm -rf "$work"' RETURN
+    local fuzzer log=build/fuzz/log corpus=${FUZZ_CORPUS:-}
+    if [ -z "$corpus" ]; then
+        corpus=$(mktemp -d)
+        trap 'rm -rf "$corpus"; trap - RETURN' RETURN
+    fi
     for fuzzer in "${fuzzers[@]}"; do
         local limit=(-runs=2000)
         [ -z "${FUZZ_SECONDS:-}" ] || limit=(-max_total_time="$FUZZ_SECONDS")
-        mkdir "$work/$fuzzer"
+        mkdir -p "$corpus/$fuzzer"
         "build/fuzz/tests/$fuzzer" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/fuzz/" \
-            "$work/$fuzzer" "tests/fuzz/corpus/$fuzzer" >"$work/log" 2>&1 || { tail -n 60 "$work/log"; return 1; }
-        echo "$fuzzer: $(sed -n 's/.*number_of_executed_units: *//p' "$work/log") executions"
+            "$corpus/$fuzzer" "tests/fuzz/corpus/$fuzzer" >"$log" 2>&1 || { tail -n 60 "$log"; return 1; }
+        echo "$fuzzer: $(sed -n 's/.*number_of_executed_units: *//p' "$log") executions"
     done
 }
 

@@ -50,6 +50,31 @@ std::string_view lineContent(std::string_view line)
     return line;
 }
 
+/// Reads the lines of a parameter file; `allNamesValid` becomes false when one is refused.
+void readParameters(std::istream& stream,
+                    std::map<std::string, std::string>& parameters,
+                    bool checkNames,
+                    bool& allNamesValid)
+{
+    std::uint64_t lineNumber = 0;
+    std::string line;
+    while (!stream.eof() && std::getline(stream, line)) {
+        ++lineNumber;
+        const std::string content(lineContent(line));
+        if (content.empty()) {
+            continue;
+        }
+        const auto [left, right] = splitString(content, "=");
+        const std::string name = stripws(left);
+        if (checkNames && parameters.count(name) == 0) {
+            messages::writeError("ERROR:", lineNumber, ":Parameter name '", name, "' is invalid");
+            allNamesValid = false;
+            continue;
+        }
+        parameters[name] = stripws(right);
+    }
+}
+
 void appendForFilename(std::string& name, char c)
 {
     switch (c) {
@@ -144,23 +169,7 @@ std::pair<std::string, std::string> splitString(const std::string& text, const c
 bool parse(std::istream& stream, std::map<std::string, std::string>& parameters, bool checkNames)
 {
     bool allNamesValid = true;
-    std::uint64_t lineNumber = 0;
-    std::string line;
-    while (!stream.eof() && std::getline(stream, line)) {
-        ++lineNumber;
-        const std::string content(lineContent(line));
-        if (content.empty()) {
-            continue;
-        }
-        const auto [left, right] = splitString(content, "=");
-        const std::string name = stripws(left);
-        if (checkNames && parameters.count(name) == 0) {
-            messages::writeError("ERROR:", lineNumber, ":Parameter name '", name, "' is invalid");
-            allNamesValid = false;
-            continue;
-        }
-        parameters[name] = stripws(right);
-    }
+    readParameters(stream, parameters, checkNames, allNamesValid);
     return allNamesValid;
 }
 
@@ -171,7 +180,14 @@ bool parse(const std::string& fileName, std::map<std::string, std::string>& para
         messages::writeError("ERROR:Could not open input file '", fileName, "'");
         return false;
     }
-    return parse(file, parameters, checkNames);
+    makePlain(file);
+    bool allNamesValid = true;
+    try {
+        readParameters(file, parameters, checkNames, allNamesValid);
+    } catch (const std::ios::failure&) {
+        return allNamesValid;  // a file ends where it cannot be read, a folder at once
+    }
+    return allNamesValid;
 }
 
 std::vector<std::string> stringtok(const std::string& text,

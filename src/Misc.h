@@ -46,7 +46,8 @@ MORVIK_API std::pair<std::string, std::string> splitString(const std::string& te
 ///                    error stream; otherwise it is inserted. Lines are counted from 1, skipped
 ///                    ones included. The lines after a refused one are still read and applied.
 /// \return false if a name was refused, else true; also after a failure of the stream, which the
-///         caller finds in the stream's state
+///         caller finds in the stream's state. Memory that is exhausted by a line is such a failure, as
+///         it is for std::getline.
 ///
 /// With {rate: "1", K: "40"} in the map, the two lines "K = 6144  // largest" and "# done" change
 /// the map to {rate: "1", K: "6144"}.

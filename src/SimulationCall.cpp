@@ -17,11 +17,13 @@ constexpr const char* streamNames[3] = {"RSC1 systematic", "RSC1 parity", "RSC2 
 constexpr std::int32_t tailPositions = 4;
 
 /// A caller's value as the input format holds it: the integer of its low bits, 24 for the hardware's
-/// format, clipped (rule 4).
-std::int32_t inputInteger(std::int32_t value, const TNumberFormat& input)
+/// format, clipped (rule 4). `excess` is what was clipped.
+std::int32_t inputInteger(std::int32_t value, const TNumberFormat& input, std::int32_t& excess)
 {
     const std::int32_t low = arithmetic::shiftRight(arithmetic::shiftLeftWrap(value, input.itsShift), input.itsShift);
-    return arithmetic::clip(low, input.itsMinQ, input.itsMaxQ);
+    const std::int32_t kept = arithmetic::clip(low, input.itsMinQ, input.itsMaxQ);
+    excess = low - kept;
+    return kept;
 }
 
 /// Reports that a value has been clipped, once in a state's life.
@@ -39,13 +41,6 @@ void reportSaturation(State& state, unsigned stream, std::int32_t position, bool
     state.saturation_reported = true;
 }
 
-/// Whether the format clips a value, and which way: -1, 0 or 1.
-int saturation(std::int32_t value, std::int32_t kept, const TNumberFormat& input)
-{
-    const std::int32_t low = arithmetic::shiftRight(arithmetic::shiftLeftWrap(value, input.itsShift), input.itsShift);
-    return low > kept ? 1 : (low < kept ? -1 : 0);
-}
-
 template <class Input>
 std::array<const Input*, 3> inOrder(const lanes::Streams<Input>& streams)
 {
@@ -60,11 +55,10 @@ void convert(State& state, const lanes::Streams<Input>& block, std::int32_t dinS
     const auto streams = inOrder(block);
     for (std::int32_t i = 0; i < dinSize; ++i) {
         for (unsigned s = 0; s < streams.size(); ++s) {
-            const std::int32_t value = streams[s][i];
-            const std::int32_t kept = inputInteger(value, *state.input_format);
-            const int direction = saturation(value, kept, *state.input_format);
-            if (direction != 0) {
-                reportSaturation(state, s, i, direction > 0);
+            std::int32_t excess = 0;
+            const std::int32_t kept = inputInteger(streams[s][i], *state.input_format, excess);
+            if (excess != 0) {
+                reportSaturation(state, s, i, excess > 0);
             }
             use(s, i, kept);
         }

@@ -8,7 +8,6 @@
 #include "Messages.h"
 #include "TraceTable.h"
 
-using arithmetic::clip;
 using arithmetic::shiftRight;
 using arithmetic::wrap16;
 
@@ -26,17 +25,11 @@ short intrinsicValue(int apriori, int systematic, int stateMask)
     return wrap16((((apriori / 2) & stateMask) + systematic) / 2);
 }
 
-/// An extrinsic value scaled, with the two exact cases of the hardware (rule 14). A general product
-/// is cut to the limits before it is converted, so that none leaves the integer's range; one that is
-/// not a number becomes the lower limit.
+/// An extrinsic value scaled, clipped and truncated toward zero (rule 14). The hardware's scales, 1 and
+/// 0.75, come out exact, since the value has 19 bits. The product is clipped before it is converted, so
+/// that none leaves the integer's range; one that is not a number becomes the lower limit.
 int scaled(int value, double scale, int lo, int hi)
 {
-    if (scale == 1.0) {
-        return value;
-    }
-    if (scale == 0.75) {
-        return 3 * value / 4;
-    }
     const double product = value * scale;
     return product > lo ? static_cast<int>(std::min<double>(product, hi)) : lo;
 }
@@ -273,7 +266,7 @@ bool TDecoder3G::calcExtrinsic(unsigned int)
     const short mask = itsExtrinsicScale == 1.0 ? wrap16(-1) : state.itsMask;
     for (unsigned j = 0; j < itsBlockSize; ++j) {
         const int extrinsic = scaled(itsLLR[j] - 4 * itsIntrinsic[j], itsExtrinsicScale, lo, hi);
-        itsExtrinsic[j] = arithmetic::maskBits(wrap16(clip(extrinsic, lo, hi)), mask);
+        itsExtrinsic[j] = arithmetic::maskBits(wrap16(extrinsic), mask);
     }
     return true;
 }

@@ -1,6 +1,7 @@
 // TInterleaver3GPPLTE: the quadratic permutation polynomial interleaver of LTE.
 #include "TInterleaver3GPPLTE.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <iterator>
 
@@ -49,26 +50,16 @@ constexpr LteParams lteParams[] = {
 };
 // clang-format on
 
-constexpr unsigned lastRow = std::size(lteParams) - 1;
-static_assert(lastRow == 187);
+static_assert(std::size(lteParams) == 188);
 
 /// The row for block size K, or null when K is no block size.
 const LteParams* findParams(unsigned K)
 {
-    if (K == 0 || K % 8 != 0 || K > lteParams[lastRow].K) {
-        return nullptr;
-    }
-    unsigned lo = 0;
-    unsigned hi = lastRow;
-    while (lo != hi) {
-        const unsigned mid = (lo + hi) / 2;
-        if (K <= lteParams[mid].K) {
-            hi = mid;
-        } else {
-            lo = mid + 1;
-        }
-    }
-    return lteParams[lo].K == K ? &lteParams[lo] : nullptr;
+    const LteParams* const row =
+        std::lower_bound(std::begin(lteParams), std::end(lteParams), K, [](const LteParams& params, unsigned size) {
+            return params.K < size;
+        });
+    return row != std::end(lteParams) && row->K == K ? row : nullptr;
 }
 
 }  // namespace

@@ -72,7 +72,7 @@ TEST(Messages, AreWholeAtAnyLength)
         const std::string text(length, 'x');
         std::ostringstream os;
         messages::writeLine(os, "a", text, 1, text, "z");
-        EXPECT_EQ(os.str(), "a" + text + "1" + text + "z\n") << length;
+        EXPECT_EQ(os.str(), std::string("a").append(text).append("1").append(text).append("z\n")) << length;
     }
 }
 

@@ -24,7 +24,7 @@ std::string errorsOf(Action action)
     testing::internal::CaptureStdout();
     testing::internal::CaptureStderr();
     action();
-    const std::string errors = testing::internal::GetCapturedStderr();
+    std::string errors = testing::internal::GetCapturedStderr();
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
     return errors;
 }

@@ -35,6 +35,56 @@ private:
     blocks::Decoder itsParts;  // owns interleaver and engine
 };
 
+/// Keeps what its last kernel was called with, and computes nothing.
+class RecordingEngine : public TCalculationEngine {
+public:
+    unsigned steps = 0;
+    std::vector<const void*> arguments;
+
+    std::string getProperties() const override
+    {
+        return "";
+    }
+
+    T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) override
+    {
+        return record(n, {intrinsic, parity0, parity1, g}, g);
+    }
+
+    T8* alpha(unsigned n, const T8* g, T8* a) override
+    {
+        return record(n, {g, a}, a);
+    }
+
+    T8* beta(unsigned n, const T8* g, T8* b) override
+    {
+        return record(n, {g, b}, b);
+    }
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        return record(n, {a, b, g, out}, out);
+    }
+
+private:
+    template <class Result>
+    Result* record(unsigned n, std::vector<const void*> pointers, Result* result)
+    {
+        steps = n;
+        arguments = std::move(pointers);
+        return result;
+    }
+};
+
+/// The kernels over a range of steps, as derived decoders use them.
+class Ranges : public SingleEngine {
+public:
+    using TDecoder3G::calcAlpha;
+    using TDecoder3G::calcBeta;
+    using TDecoder3G::calcGamma;
+    using TDecoder3G::calcLLR;
+};
+
 /// 1, 2, 3, ...
 Soft numbered(std::size_t count)
 {
@@ -150,6 +200,15 @@ TEST(TDecoder3G, UsesAPermutationOfTheBlockSizeAsItStands)
     const Soft soft = numbered(132);
     ASSERT_TRUE(decoder.extract(soft));
     EXPECT_EQ(decoder.itsSys[1], stream(soft, 3, 0, pi, {6, 8, 10}));
+}
+
+TEST(TDecoder3G, MakesThePermutationEvenIfItsInverseIsThere)
+{
+    SingleEngine decoder;
+    decoder.itsInterleaver->itsPiInv.assign(40, 0);
+    const Soft soft = numbered(132);
+    ASSERT_TRUE(decoder.extract(soft));
+    EXPECT_EQ(decoder.itsSys[1], stream(soft, 3, 0, plain::permutation(40), {6, 8, 10}));
 }
 
 TEST(TDecoder3G, RefusesLengthsThatAreNoBlock)
@@ -402,6 +461,42 @@ TEST(TDecoder3G, RunsPassesOverTheWholeTrellisInterleavedOrderFirst)
             }
         }
     }
+}
+
+TEST(TDecoder3G, HandsARangeOfStepsToTheKernels)
+{
+    using Pointers = std::vector<const void*>;
+    RecordingEngine engine;
+    Ranges decoder;
+    ASSERT_TRUE(decoder.extract(Soft(132)));
+    decoder.itsEngine = &engine;
+    for (const unsigned h : {0U, 1U}) {
+        const unsigned d = 1 - h;
+        for (const auto& [j, k] : std::vector<std::pair<unsigned, unsigned>>{{0, 42}, {5, 20}, {42, 42}}) {
+            ASSERT_TRUE(decoder.calcGamma(h, j, k));
+            EXPECT_EQ(engine.steps, k - j + 1);
+            EXPECT_EQ(
+                engine.arguments,
+                (Pointers{
+                    &decoder.itsIntrinsic[j], &decoder.itsPar0[d][j], &decoder.itsPar1[d][j], decoder.itsGamma + j}));
+            ASSERT_TRUE(decoder.calcAlpha(h, j, k));
+            EXPECT_EQ(engine.steps, k - j + 1);
+            EXPECT_EQ(engine.arguments, (Pointers{decoder.itsGamma + j, decoder.itsAlpha + j}));
+            ASSERT_TRUE(decoder.calcBeta(h, k, j));
+            EXPECT_EQ(engine.steps, k - j + 1);
+            EXPECT_EQ(engine.arguments, (Pointers{decoder.itsGamma + k, decoder.itsBeta + k}));
+            ASSERT_TRUE(decoder.calcLLR(h, j, k));
+            EXPECT_EQ(engine.steps, k - j + 1);
+            EXPECT_EQ(engine.arguments,
+                      (Pointers{decoder.itsAlpha + j, decoder.itsBeta + j, decoder.itsGamma + j, &decoder.itsLLR[j]}));
+        }
+    }
+    ASSERT_TRUE(decoder.calcGamma(1));  // the whole trellis
+    EXPECT_EQ(engine.steps, 43U);
+    EXPECT_EQ(engine.arguments.back(), decoder.itsGamma);
+    ASSERT_TRUE(decoder.calcLLR(1));
+    EXPECT_EQ(engine.steps, 43U);
+    EXPECT_EQ(engine.arguments.back(), decoder.itsLLR.data());
 }
 
 TEST(TDecoder3G, WritesNoColumnBeyondTheTrellis)

@@ -1,24 +1,37 @@
-// Allocation failure: every single allocation of creating a state and of decoding a block fails in
-// turn. Nothing crashes or leaks, the documented message or exception comes, the state still works.
+// Allocation failure: every single allocation of creating a state, of decoding a block and of the conversions
+// of values and texts fails in turn. Nothing crashes or leaks, the documented message or exception comes, the
+// state still works, and no result is cut short.
 //
 // The program is linked from the model's objects, with their malloc and free wrapped by the linker.
 #include <gtest/gtest.h>
+#include <unistd.h>
 
+#include <cstdint>
+#include <cstdio>
 #include <cstdlib>
+#include <fstream>
+#include <functional>
 #include <iostream>
+#include <map>
 #include <new>
+#include <sstream>
 #include <streambuf>
+#include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
+#include "Misc.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
+// NOLINTBEGIN(bugprone-reserved-identifier): the linker chooses these names.
 extern "C" {
 void* __real_malloc(std::size_t size);
 void __real_free(void* memory);
 void* __wrap_malloc(std::size_t size);
 void __wrap_free(void* memory);
 }
+// NOLINTEND(bugprone-reserved-identifier)
 
 namespace {
 
@@ -138,6 +151,8 @@ private:
     std::streambuf* itsCerr;
     long itsLiveBlocks;
 };
+
+using Parameters = std::map<std::string, std::string>;
 
 constexpr unsigned manyAllocations = 100000;  // more than any call needs, less than for ever
 
@@ -267,4 +282,118 @@ TEST(AllocationFailure, OfADecodeLeavesAWorkingState)
             EXPECT_EQ(liveBlocks, live);
         }
     }
+}
+
+/// Lets every allocation of a call fail in turn: it must throw each time, and give what is expected when none is
+/// left to fail. How many there are.
+template <class Result>
+unsigned everyAllocationFails(const std::function<Result()>& call, const Result& expected)
+{
+    for (unsigned which = 1; which < manyAllocations; ++which) {
+        bool thrown = false;
+        bool happened = false;
+        bool asExpected = false;
+        long leaked = 0;
+        {
+            const FailingAllocation failing(which);
+            try {
+                asExpected = call() == expected;
+            } catch (const std::bad_alloc&) {
+                thrown = true;
+            }
+            happened = FailingAllocation::happened();
+            leaked = failing.leaked();
+        }
+        EXPECT_EQ(leaked, 0) << which;
+        EXPECT_EQ(thrown, happened) << which;
+        if (!happened) {
+            EXPECT_TRUE(asExpected);
+            return which - 1;
+        }
+    }
+    return manyAllocations;
+}
+
+TEST(AllocationFailure, NeverShortensAText)
+{
+    const struct {
+        std::function<std::string()> call;
+        std::string expected;
+        unsigned allocations;  // at least; a text of up to 15 characters needs none
+    } cases[] = {
+        {[] { return toSIString(1500.0); }, "1.50 k", 0},
+        {[] { return toSIString(-1500.0L, 30); }, "-1.500000000000000000000000000000 k", 2},
+        {[] { return toSIString(std::uint64_t{2}, 600); }, "2." + std::string(600, '0') + " ", 3},
+        {[] { return toSIString(std::uint32_t{2}, 20000); }, "2." + std::string(20000, '0') + " ", 4},
+        {[] { return timeToString(59U); }, "59s", 0},
+        {[] { return timeToString(90.0); }, "1.5min", 0},
+        {[] { return timeToString(86400L); }, "24hr", 0},
+        {[] { return timeToString(345600U); }, "1.33333days", 0},
+    };
+    for (const auto& [call, expected, allocations] : cases) {
+        SCOPED_TRACE(expected.substr(0, 40));
+        const unsigned failures = everyAllocationFails(call, expected);
+        EXPECT_GE(failures, allocations);
+        EXPECT_LT(failures, 100U);
+    }
+}
+
+TEST(AllocationFailure, NeverShortensANumber)
+{
+    using Call = std::function<std::int32_t()>;
+    const std::string long40 = "1" + std::string(39, '0');
+    const std::pair<Call, std::int32_t> calls[] = {
+        {[] { return stringToTime("90"); }, 90},
+        {[] { return stringToTime("                    1.5 minutes"); }, 90},
+        {[&] { return stringToTime(long40 + "e-39h"); }, 3600},
+    };
+    for (const auto& [call, expected] : calls) {
+        SCOPED_TRACE(expected);
+        const unsigned failures = everyAllocationFails(call, expected);
+        EXPECT_GE(failures, 1U);
+        EXPECT_LT(failures, 100U);
+    }
+}
+
+const std::string longValue(600, 'x');
+const std::string parameterLines = "a = 1\nb = " + longValue + "\nc = 3\n";
+const Parameters readParameters{{"a", "1"}, {"b", longValue}, {"c", "3"}};
+
+TEST(AllocationFailure, NeverShortensAParameterFile)
+{
+    const std::string name = testing::TempDir() + "morvik_allocation_" + std::to_string(getpid());
+    std::ofstream(name) << parameterLines;
+    const std::function<Parameters()> call = [&name] {
+        Parameters parameters;
+        EXPECT_TRUE(parse(name, parameters, false));
+        return parameters;
+    };
+    const unsigned failures = everyAllocationFails(call, readParameters);
+    EXPECT_GE(failures, 6U);  // the file's buffer, three entries, the long line and value
+    EXPECT_LT(failures, 100U);
+    std::remove(name.c_str());
+}
+
+TEST(AllocationFailure, OfALineIsAFailureOfItsStream)
+{
+    unsigned which = 1;
+    for (bool happened = true; happened && which < 100; ++which) {
+        std::istringstream stream(parameterLines);
+        Parameters parameters;
+        bool complete = true;
+        {
+            const FailingAllocation failing(which);
+            try {
+                parse(stream, parameters, false);
+                complete = !stream.bad();
+            } catch (const std::bad_alloc&) {
+                complete = false;
+            }
+            happened = FailingAllocation::happened();
+        }
+        EXPECT_EQ(complete, !happened) << which;
+        EXPECT_EQ(parameters == readParameters, complete) << which;
+    }
+    EXPECT_GT(which, 6U);
+    EXPECT_LT(which, 100U);
 }

@@ -130,7 +130,7 @@ TEST(Generics, HaveTheDocumentedDefaults)
 
 TEST(Generics, AreFourteenWords)
 {
-    EXPECT_EQ(sizeof(Generics), 3 * sizeof(void*) + 11 * 4 + (sizeof(void*) == 8 ? 4 : 0));
+    EXPECT_EQ(sizeof(Generics), 3 * sizeof(void*) + 11 * sizeof(std::int32_t) + (sizeof(void*) == 8 ? 4 : 0));
     EXPECT_EQ(offsetof(Generics, C_RESERVED_1), 3 * sizeof(void*));
     EXPECT_EQ(offsetof(Generics, C_ALGORITHM_TYPE), 3 * sizeof(void*) + 40);
 }

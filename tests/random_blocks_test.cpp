@@ -4,7 +4,6 @@
 // MORVIK_TEST_SEED and MORVIK_TEST_BLOCKS in the environment choose another run.
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <iomanip>
 #include <sstream>
 #include <string>
@@ -13,16 +12,11 @@
 #include "support/Blocks.h"
 #include "support/CapturedStreams.h"
 #include "support/Configurations.h"
+#include "support/Environment.h"
 #include "support/ExpectText.h"
 #include "support/PlainDecoder.h"
 
 namespace {
-
-unsigned fromEnvironment(const char* name, unsigned otherwise)
-{
-    const char* value = std::getenv(name);
-    return value == nullptr ? otherwise : static_cast<unsigned>(std::strtoul(value, nullptr, 10));
-}
 
 /// A trace cell: the real value of an aligned word, or 12 characters that nobody looks at.
 std::string cell(const std::vector<int>& values, std::size_t n)

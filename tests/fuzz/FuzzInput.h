@@ -44,6 +44,16 @@ public:
         return static_cast<std::int32_t>(word());
     }
 
+    /// As many bytes as the next one says, or those that are left.
+    std::string shortText()
+    {
+        std::string taken;
+        for (unsigned left = byte(); left > 0 && !empty(); --left) {
+            taken += static_cast<char>(byte());
+        }
+        return taken;
+    }
+
     /// All that is left.
     std::string text()
     {

@@ -1,6 +1,7 @@
 // simulate_fuzz: any sequence of calls on one state: blocks that shrink and grow, refusals in
 // between, traces armed at any time. A block decodes alike before and after all of it.
 #include <algorithm>
+#include <limits>
 #include <vector>
 
 #include "FuzzInput.h"
@@ -16,14 +17,22 @@ struct Block {
     std::uint32_t iterations = 1;
 };
 
-/// Sizes of every kind: none, below the tail's, valid, unknown to the interleaver, not to be
-/// divided into segments, and too large.
-constexpr std::int32_t positions[] = {4,   1,   3,   5,   44,  48,  52,   132,  135, 136, 260,  264,
-                                      300, 516, 517, 532, 644, 772, 1028, 1060, 48,  44,  2052, 3000};
+/// Numbers of positions, K + 4, of every kind: none at all, fewer than the tail's, K = 0, block sizes up to
+/// the largest, K that the interleaver does not know, K that cannot be cut into equal segments, and too many.
+constexpr std::int32_t positions[] = {4,   1,   3,   5,   44,  48,   52,   132,  135,  136,  260,  264,  300,
+                                      516, 517, 532, 644, 772, 1028, 1060, 2052, 3000, 6148, 6149, 7000, 0};
+constexpr unsigned listed = sizeof positions / sizeof *positions;
+
+/// One of the numbers of positions above, or any other.
+std::size_t takeSize(FuzzInput& input)
+{
+    const unsigned choice = input.below(listed + 1);
+    return choice < listed ? static_cast<std::size_t>(positions[choice]) : input.word() % 6200;
+}
 
 Block takeBlock(FuzzInput& input)
 {
-    const auto size = static_cast<std::size_t>(positions[input.below(sizeof positions / sizeof *positions)]);
+    const std::size_t size = takeSize(input);
     Block block;
     block.iterations = 1 + input.below(3);
     std::uint32_t seed = input.word() | 1U;
@@ -35,7 +44,7 @@ Block takeBlock(FuzzInput& input)
             value = static_cast<std::int32_t>(seed) >> shift;
         }
         if (size > 0) {
-            stream[input.below(static_cast<unsigned>(size))] = input.integer();
+            stream[input.word() % size] = input.integer();
         }
     }
     return block;
@@ -70,6 +79,15 @@ Bits decode(State* state, const Block& block, std::uint32_t room, std::uint32_t 
     return bits;
 }
 
+/// 0 or less, down to the smallest integer.
+std::int32_t noSize(FuzzInput& input)
+{
+    const unsigned choice = input.below(4);
+    return choice < 2    ? -static_cast<std::int32_t>(choice)
+           : choice == 2 ? std::numeric_limits<std::int32_t>::min()
+                         : std::min(input.integer(), 0);
+}
+
 /// One bad argument, anything else as it should be.
 void callWithBadArgument(FuzzInput& input, State* state, const Block& block)
 {
@@ -81,7 +99,7 @@ void callWithBadArgument(FuzzInput& input, State* state, const Block& block)
         streams[bad] = nullptr;
     }
     outputs.dout = bad == 3 ? nullptr : &bit;
-    const std::int32_t size = bad == 4 ? -static_cast<std::int32_t>(input.below(4)) : 44;
+    const std::int32_t size = bad == 4 ? noSize(input) : 44;
     const std::int32_t status = veltra_ip_morvik_v1_0_bitacc_simulate(
         bad == 5 ? nullptr : state, streams[0], streams[1], streams[2], size, 1, 0, bad == 6 ? nullptr : &outputs);
     require(status == 1, "a bad argument has status 1");

@@ -97,7 +97,7 @@ Block encode(const std::vector<int>& bits, int amplitude)
             tail.push_back(soft(output.systematic));
             tail.push_back(soft(output.parity));
         }
-        for (unsigned position : {0U, 1U}) {
+        for (const std::size_t position : {0U, 1U}) {
             block.sys.push_back(tail[3 * position]);
             block.par1.push_back(tail[3 * position + 1]);
             block.par2.push_back(tail[3 * position + 2]);

@@ -54,6 +54,7 @@ Process::Process(const std::string& program,
     }
 }
 
+// NOLINTNEXTLINE(readability-make-member-function-const): the process is gone afterwards.
 int Process::wait()
 {
     int status = 0;

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <iterator>
 #include <map>
 
 #include "QppTable.h"
@@ -260,12 +261,7 @@ private:
 
 bool knownBlockSize(unsigned K)
 {
-    for (const QppParameters& row : qppTable) {
-        if (row.K == K) {
-            return true;
-        }
-    }
-    return false;
+    return std::any_of(std::begin(qppTable), std::end(qppTable), [K](const QppParameters& row) { return row.K == K; });
 }
 
 std::vector<unsigned> permutation(unsigned K)

@@ -35,7 +35,8 @@ public:
         if (itsRule == Decision::Max) {
             return winner;
         }
-        const int correction = itsTable.at(static_cast<std::size_t>(difference + 32768));
+        const int index = difference + 32768;
+        const int correction = itsTable.at(static_cast<std::size_t>(index));
         if (itsRule == Decision::MaxStar) {
             return {wrap16(winner.value + correction), 0};
         }
