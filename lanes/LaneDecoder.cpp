@@ -118,6 +118,7 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
 std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char* base) const
 {
     const std::size_t row = kernel.lanes;
+    const std::size_t wideRow = row + std::size_t{2} * kernel.vectorLanes;
     const std::size_t rows = steps() * row;
     const std::size_t windows = itsCut.windowStart.size() - 1;
     Layout layout(base);
@@ -135,13 +136,14 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
                                 work.sourceRow[d],
                                 work.permutations[d],
                                 layout.take<std::int16_t>(states * row),
-                                layout.take<std::int16_t>(windows * states * row)};
+                                layout.take<std::int16_t>(windows * states * row),
+                                layout.take<std::int16_t>(states * wideRow),
+                                layout.take<std::int16_t>(states * wideRow)};
     }
     space.firstLanes = work.firstLanes = layout.take<std::int16_t>(row);
     space.lastLanes = work.lastLanes = layout.take<std::int16_t>(row);
     space.slots = layout.take<std::int16_t>(std::size_t{longestWindow} * kernel.slotBytes / 2);
     space.forward = layout.take<std::int16_t>(kernel.forwardBytes / 2);
-    space.reached = layout.take<std::int16_t>(2 * states * (row + std::size_t{2} * kernel.vectorLanes));
     space.ratios = layout.take<std::int16_t>(rows);
     return layout.size();
 }
@@ -238,6 +240,9 @@ void LaneDecoder::prepareStarts(unsigned d)
     std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * row;
     std::fill_n(alpha, states * row, std::int16_t{0});
     std::fill(beta, lastBeta + states * row, std::int16_t{0});
+    const std::size_t reached = states * (row + std::size_t{2} * itsKernel->vectorLanes);
+    std::fill_n(space.constituent[d].alphaReached, reached, std::int16_t{0});
+    std::fill_n(space.constituent[d].betaReached, reached, std::int16_t{0});
     for (unsigned first = 0; first < row; first += space.segments) {
         const std::array<int, 12>& t = itsTails[blockOf(first)];
         const unsigned o = 6 * d;

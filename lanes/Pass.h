@@ -31,7 +31,17 @@ class Pass {
 
 public:
     MORVIK_INLINE Pass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint)
-        : w(workspace), itsRows(workspace.constituent[d]), itsJoint(joint), itsRule(workspace.corrections)
+        : w(workspace),
+          itsRows(workspace.constituent[d]),
+          itsSource(joint),
+          itsSourceRow(itsRows.sourceRow),
+          itsPermutations(itsRows.permutations),
+          itsParity(itsRows.parity),
+          itsSystematic(itsRows.systematic),
+          itsJoint(itsRows.joint),
+          itsRatios(w.ratios),
+          itsSlots(w.slots),
+          itsRule(workspace.corrections)
     {
     }
 
@@ -39,26 +49,31 @@ public:
     template <bool last>
     MORVIK_INLINE void run(bool first) const
     {
+        // The last row starts from what the first row reached: in this pass, when there is a row between
+        // them in which the hardware can hand it on (rule 20), else in the pass before.
+        const bool handedWithin = !first && w.windows > 2;
+        hand(itsRows.alphaReached + count - 1, itsRows.alphaStart, w.firstLanes);
+        if (!handedWithin) {
+            handBack();
+        }
         for (unsigned v = 0; v < vectors; ++v) {
             saveForward(v, load(itsRows.alphaStart + v * count));
         }
-        // The first row's end columns are handed to the last row. Where it takes them up in this pass, they
-        // must be there; in a first pass, and with two rows, it still starts from what it had.
-        const unsigned lastRow = w.windows - 1;
-        const unsigned handBackAfter = first || lastRow < 1 ? lastRow : 1;
         Window window = {0, 0, 0, w.windowStart[1], 0, slotWords};
         runForward(window);
         for (unsigned r = 0; r < w.windows; ++r) {
+            if (r == 2 && handedWithin) {
+                handBack();
+            }
             for (unsigned v = 0; v < vectors; ++v) {
                 const Window next = following(window);
                 runWindows<last>(window, next);
                 window = next;
             }
-            if (r == handBackAfter) {
-                handBack();
-            }
         }
-        handForward();
+        for (unsigned v = 0; v < vectors; ++v) {
+            storeBorder(restoreForward(v), itsRows.alphaReached + (v + 1) * count, wideRow);
+        }
     }
 
 private:
@@ -152,7 +167,7 @@ private:
 
     MORVIK_INLINE void forward(const Window& window, unsigned from, unsigned to, Column& a) const
     {
-        std::int16_t* slot = w.slots + window.slotOf(from);
+        std::int16_t* slot = itsSlots + window.slotOf(from);
         for (unsigned k = from; k < to; ++k) {
             forwardStep(k, window.v, slot, a);
             slot += window.direction;
@@ -162,7 +177,7 @@ private:
     template <bool last, bool wrapping>
     MORVIK_INLINE void backward(const Window& window, unsigned from, unsigned to, Column& b) const
     {
-        const std::int16_t* slot = w.slots + window.slotOf(to);
+        const std::int16_t* slot = itsSlots + window.slotOf(to);
         for (unsigned k = to; k-- > from;) {
             slot -= window.direction;
             backwardStep<last, wrapping>(k, window.v, slot, b);
@@ -173,8 +188,8 @@ private:
     MORVIK_INLINE void both(
         const Window& window, unsigned to, Column& b, const Window& next, unsigned steps, Column& a) const
     {
-        const std::int16_t* slot = w.slots + window.slotOf(to);
-        std::int16_t* nextSlot = w.slots + next.slot;
+        const std::int16_t* slot = itsSlots + window.slotOf(to);
+        std::int16_t* nextSlot = itsSlots + next.slot;
         for (unsigned i = 0; i < steps; ++i) {
             slot -= window.direction;
             backwardStep<last, false>(to - 1 - i, window.v, slot, b);
@@ -186,10 +201,10 @@ private:
     MORVIK_INLINE void forwardStep(unsigned k, unsigned v, std::int16_t* slot, Column& a) const
     {
         using Lanes = Permutation<count, vectors>;
-        const std::int16_t* source = itsJoint + itsRows.sourceRow[k] * row;
-        __builtin_prefetch(itsJoint + itsRows.sourceRow[k + lanes::fetchAhead] * row);
-        const Value joint = Lanes::load(source, itsRows.permutations + (k * vectors + v) * Lanes::bytes);
-        BranchMetrics g = trellis::branchSums(joint, Value::load(itsRows.parity + at(k, v)), Value{});
+        const std::int16_t* source = itsSource + itsSourceRow[k] * row;
+        __builtin_prefetch(itsSource + itsSourceRow[k + lanes::fetchAhead] * row);
+        const Value joint = Lanes::load(source, itsPermutations + (k * vectors + v) * Lanes::bytes);
+        BranchMetrics g = trellis::branchSums(joint, Value::load(itsParity + at(k, v)), Value{});
         for (Value& metric : g) {
             metric = clip(metric, lanes::branchMin, lanes::branchMax);
         }
@@ -216,10 +231,10 @@ private:
         const auto c = trellis::candidates(itsRule.decision(), b, g);
         const Value ratio = wrapping ? itsRule.wrapping(alpha, beta, g) : itsRule.ratio(alpha, beta, g, c);
         if constexpr (last) {
-            ratio.store(w.ratios + at(k, v));
+            ratio.store(itsRatios + at(k, v));
         }
         const Value joint = Value::load(slot + slotJoint);
-        nextJoint(ratio, joint, Value::load(itsRows.systematic + at(k, v))).store(itsRows.joint + at(k, v));
+        nextJoint(ratio, joint, Value::load(itsSystematic + at(k, v))).store(itsJoint + at(k, v));
         b = trellis::backwardStep(itsRule.decision(), c);
     }
 
@@ -274,18 +289,13 @@ private:
         });
     }
 
-    MORVIK_INLINE std::int16_t* reached(unsigned direction, unsigned v) const
-    {
-        return w.reached + direction * states * wideRow + (v + 1) * count;
-    }
-
     /// The column that a window reached is where the window before it starts next time; the first one's
     /// belongs to the segment before, to its last window.
     MORVIK_INLINE void storeReached(const Window& window, const Column& b) const
     {
         const Column m = broughtBack(b);
         if (window.r == 0) {
-            storeBorder(m, reached(1, window.v), wideRow);
+            storeBorder(m, itsRows.betaReached + (window.v + 1) * count, wideRow);
         } else {
             storeBorder(m, itsRows.betaStart + (window.r - 1) * states * row + window.v * count, row);
         }
@@ -293,16 +303,7 @@ private:
 
     MORVIK_INLINE void handBack() const
     {
-        std::int16_t* starts = itsRows.betaStart + (w.windows - 1) * states * row;
-        hand(reached(1, 0) + 1, starts, w.lastLanes);
-    }
-
-    MORVIK_INLINE void handForward() const
-    {
-        for (unsigned v = 0; v < vectors; ++v) {
-            storeBorder(restoreForward(v), reached(0, v), wideRow);
-        }
-        hand(reached(0, 0) - 1, itsRows.alphaStart, w.firstLanes);
+        hand(itsRows.betaReached + count + 1, itsRows.betaStart + (w.windows - 1) * states * row, w.lastLanes);
     }
 
     /// Columns move to a neighbouring lane, but for the lanes at a block's border, which keep theirs.
@@ -317,9 +318,18 @@ private:
         }
     }
 
-    const lanes::Workspace w;
-    const lanes::ConstituentRows itsRows;
-    const std::int16_t* itsJoint;
+    const lanes::Workspace& w;
+    const lanes::ConstituentRows& itsRows;
+
+    // What every step uses, at hand: stores of values might change what is behind a reference.
+    const std::int16_t* const itsSource;  ///< joint values of the other decoder
+    const std::uint32_t* const itsSourceRow;
+    const std::uint8_t* const itsPermutations;
+    const std::int16_t* const itsParity;
+    const std::int16_t* const itsSystematic;
+    std::int16_t* const itsJoint;
+    std::int16_t* const itsRatios;
+    std::int16_t* const itsSlots;
     const Rule itsRule;
 };
 

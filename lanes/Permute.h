@@ -12,6 +12,19 @@ namespace MORVIK_LANES {
 
 #if defined(__AVX512BW__) && defined(__AVX512VL__)
 
+template <unsigned count>
+MORVIK_INLINE Steps<count> permuteWords(Steps<count> a, typename Steps<count>::Vector index)
+{
+    using Vector = typename Steps<count>::Vector;
+    if constexpr (count == 8) {
+        return {(Vector)_mm_permutexvar_epi16((__m128i)index, (__m128i)a.v)};
+    } else if constexpr (count == 16) {
+        return {(Vector)_mm256_permutexvar_epi16((__m256i)index, (__m256i)a.v)};
+    } else {
+        return {(Vector)_mm512_permutexvar_epi16((__m512i)index, (__m512i)a.v)};
+    }
+}
+
 /// An index word for each lane.
 template <unsigned count, unsigned vectors>
 struct Permutation {
@@ -30,23 +43,7 @@ struct Permutation {
     {
         typename Steps<count>::Vector index;
         std::memcpy(&index, control, sizeof index);
-        return permute(Steps<count>::load(row), index);
-    }
-
-private:
-    static MORVIK_INLINE Steps<8> permute(Steps<8> a, Steps<8>::Vector index)
-    {
-        return {(Steps<8>::Vector)_mm_permutexvar_epi16((__m128i)index, (__m128i)a.v)};
-    }
-
-    static MORVIK_INLINE Steps<16> permute(Steps<16> a, Steps<16>::Vector index)
-    {
-        return {(Steps<16>::Vector)_mm256_permutexvar_epi16((__m256i)index, (__m256i)a.v)};
-    }
-
-    static MORVIK_INLINE Steps<32> permute(Steps<32> a, Steps<32>::Vector index)
-    {
-        return {(Steps<32>::Vector)_mm512_permutexvar_epi16((__m512i)index, (__m512i)a.v)};
+        return permuteWords<count>(Steps<count>::load(row), index);
     }
 };
 
@@ -125,33 +122,45 @@ public:
 #if defined(__SSSE3__)
     explicit MORVIK_INLINE Table(const std::uint8_t* entries)
     {
-        for (unsigned i = 0; i < sizeof itsBytes; ++i) {
-            reinterpret_cast<std::uint8_t*>(&itsBytes)[i] = entries[i % 16];
+        for (unsigned lane = 0; lane < count; ++lane) {
+            if constexpr (byWords) {
+                itsEntries[lane] = entries[lane % 16];
+            } else {
+                std::memcpy(reinterpret_cast<char*>(&itsEntries) + 2 * lane, entries + 2 * lane % 16, 2);
+            }
         }
     }
 
-    /// The entries at `index`, 0 to 15. A byte shuffle gives 0 where the index byte's sign bit is set: the
-    /// upper byte's.
+    /// The entries at `index`, 0 to 15.
     MORVIK_INLINE Steps<count> at(Steps<count> index) const
     {
-        return shuffle(index | Steps<count>::of(-0x8000));
+#if defined(__AVX512BW__)
+        if constexpr (byWords) {
+            return permuteWords<count>({itsEntries}, index.v);
+        } else
+#endif
+        {
+            // A byte shuffle gives 0 where the index byte's sign bit is set: the upper byte's.
+            return shuffleBytes(index | Steps<count>::of(-0x8000));
+        }
     }
 
 private:
-    typename Steps<count>::Vector itsBytes;
+#if defined(__AVX512BW__)
+    static constexpr bool byWords = count >= 16;
+#else
+    static constexpr bool byWords = false;
+#endif
+    typename Steps<count>::Vector itsEntries;
 
-    MORVIK_INLINE Steps<count> shuffle(Steps<count> control) const
+    MORVIK_INLINE Steps<count> shuffleBytes(Steps<count> control) const
     {
         using Vector = typename Steps<count>::Vector;
         if constexpr (count == 8) {
-            return {(Vector)_mm_shuffle_epi8((__m128i)itsBytes, (__m128i)control.v)};
+            return {(Vector)_mm_shuffle_epi8((__m128i)itsEntries, (__m128i)control.v)};
 #if defined(__AVX2__)
-        } else if constexpr (count == 16) {
-            return {(Vector)_mm256_shuffle_epi8((__m256i)itsBytes, (__m256i)control.v)};
-#endif
-#if defined(__AVX512BW__)
         } else {
-            return {(Vector)_mm512_shuffle_epi8((__m512i)itsBytes, (__m512i)control.v)};
+            return {(Vector)_mm256_shuffle_epi8((__m256i)itsEntries, (__m256i)control.v)};
 #endif
         }
     }

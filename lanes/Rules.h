@@ -80,7 +80,7 @@ struct Corrections {
 
     MORVIK_INLINE Steps<count> operator()(Steps<count> difference) const
     {
-        const Steps<count> magnitude = difference ^ (difference >> 15);
+        const Steps<count> magnitude = max(difference, Steps<count>::of(-1) - difference);  // -1 reads like 0
         return table.at(min(magnitude, Steps<count>::of(4 * 15)) >> 2);
     }
 

@@ -171,7 +171,8 @@ struct Aligned {
 
     friend MORVIK_INLINE Aligned maxWrap(Aligned c1, Aligned c2)
     {
-        return select(subWrap(c1, c2), c1, c2);
+        const Signed difference = subWrap(c1, c2).word();
+        return addWrap(c2, Aligned(reinterpret_cast<Unsigned>(difference > 0 ? difference : Signed{})));
     }
 };
 

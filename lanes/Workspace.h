@@ -21,6 +21,10 @@ struct ConstituentRows {
     const std::uint8_t* permutations;  ///< [step] how that row's lanes are permuted; the form is the kernel's own
     std::int16_t* alphaStart;          ///< [state][lane] start columns of the segments
     std::int16_t* betaStart;           ///< [window][state][lane] start columns of the windows
+    /// [state][lane], a vector longer at both ends: the columns that the last pass reached at the ends of
+    /// segments, and at the beginnings. A lane's are the start of its neighbour.
+    std::int16_t* alphaReached;
+    std::int16_t* betaReached;
 };
 
 /// A row's source is fetched so many steps ahead of its use.
@@ -37,7 +41,6 @@ struct Workspace {
     const std::int16_t* lastLanes;    ///< [lane] all ones in each block's last lane, else 0
     std::int16_t* slots;              ///< forward and branch metrics and joint values of one window
     std::int16_t* forward;            ///< [vector][metric] the forward recursion between two windows
-    std::int16_t* reached;            ///< [2][state][lane], a vector longer at both ends: columns on their way
     std::int16_t* ratios;             ///< [step][lane] log-likelihood ratios of the last pass
 };
 

@@ -104,7 +104,7 @@ struct DecideMaxHash {
     MORVIK_INLINE constexpr Metric decide(Metric c1, Metric c2) const
     {
         const Value difference = subWrap(c1.value, c2.value);
-        const Value winner = select(difference, c1.value, c2.value);
+        const Value winner = maxWrap(c1.value, c2.value);
         const Value pending = select(difference, c1.pending, c2.pending);
         return {addWrap(winner, pending), table(difference)};
     }
