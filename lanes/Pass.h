@@ -334,10 +334,7 @@ private:
 };
 
 template <class Rule, unsigned vectors, bool scaled, bool last>
-__attribute__((flatten, noinline)) void runPass(const lanes::Workspace& workspace,
-                                                unsigned d,
-                                                const std::int16_t* joint,
-                                                bool first)
+MORVIK_INLINE_CALLS void runPass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint, bool first)
 {
     Pass<Rule, vectors, scaled>(workspace, d, joint).template run<last>(first);
 }

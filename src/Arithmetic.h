@@ -7,13 +7,22 @@
 
 #include <cstdint>
 
-/// The steps over the trellis are short and run millions of times: no call may be left of them.
-#if defined(__GNUC__)
+// The steps over the trellis are short and run millions of times: no call may be left of them. Builds
+// without optimisation and with sanitizers keep their calls, or they would take for ever to compile.
+#if defined(__has_feature)
+#define MORVIK_HAS_FEATURE(name) __has_feature(name)
+#else
+#define MORVIK_HAS_FEATURE(name) 0
+#endif
+#if defined(__OPTIMIZE__) && !defined(__SANITIZE_ADDRESS__) && !defined(__SANITIZE_THREAD__) && \
+    !MORVIK_HAS_FEATURE(address_sanitizer) && !MORVIK_HAS_FEATURE(thread_sanitizer)
 #define MORVIK_INLINE inline __attribute__((always_inline))
 #define MORVIK_INLINE_LAMBDA __attribute__((always_inline))
+#define MORVIK_INLINE_CALLS __attribute__((flatten, noinline))
 #else
 #define MORVIK_INLINE inline
 #define MORVIK_INLINE_LAMBDA
+#define MORVIK_INLINE_CALLS
 #endif
 
 namespace arithmetic {
