@@ -53,7 +53,7 @@ lanes::BlockCut cutOf(unsigned K, unsigned units, const TInterleaver& interleave
 {
     lanes::BlockCut cut;
     cut.blockSize = K;
-    cut.segments = segmentation::segmentCount(K, 4 * units);
+    cut.segments = segmentation::segmentCount(K, std::uint64_t{4} * units);
     cut.windowStart = segmentation::windowStarts(K / cut.segments);
     interleaver.calcInterleaver(cut.permutation, K);
     return cut;
@@ -104,6 +104,7 @@ std::vector<Results> componentResults(Components& components, const blocks::Bloc
 std::vector<Results> laneResults(LaneDecoder& decoder, const std::vector<blocks::Block>& blocks, unsigned passes)
 {
     std::vector<lanes::Streams<std::int32_t>> streams;
+    streams.reserve(blocks.size());
     std::vector<Results> all(blocks.size(), Results(decoder.blockCut().blockSize));
     for (const blocks::Block& block : blocks) {
         streams.push_back({block.sys.data(), block.par1.data(), block.par2.data()});
@@ -150,6 +151,7 @@ protected:
         LaneDecoder decoder(*GetParam(), algorithm, corrections);
         decoder.setBlockCut(cutOf(K, units, *components.interleaver));
         std::vector<std::vector<Results>> expected;
+        expected.reserve(blocks.size());
         for (const blocks::Block& block : blocks) {
             expected.push_back(componentResults(components, block, passes));
         }
@@ -347,7 +349,8 @@ TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
     unsigned turn = seed;
     for (const unsigned K : blocks::blockSizes()) {
         for (const unsigned units : {2U, 4U, 8U}) {
-            const unsigned capacity = std::max(1U, lanesOfRow() / segmentation::segmentCount(K, 4 * units));
+            const unsigned capacity =
+                std::max(1U, lanesOfRow() / segmentation::segmentCount(K, std::uint64_t{4} * units));
             for (const Algorithm algorithm : algorithms) {
                 const std::vector<unsigned> sizes = batchSizes(capacity);
                 for (std::size_t i = 0; i < sizes.size(); ++i) {
