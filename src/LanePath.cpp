@@ -24,6 +24,34 @@ lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
     return table;
 }
 
+/// While it lives, decodes are neither traced nor counted: they have been before. Exhausted memory may end it.
+class UncountedDecodes {
+public:
+    explicit UncountedDecodes(TDecoder& decoder)
+        : itsDecoder(decoder),
+          itsDecodes(decoder.itsDecodeCount),
+          itsHalfIterations(decoder.itsHalfIterationCount),
+          itsDumps(std::exchange(decoder.itsDumpCount, 0U))
+    {
+    }
+
+    ~UncountedDecodes()
+    {
+        itsDecoder.itsDumpCount = itsDumps;
+        itsDecoder.itsHalfIterationCount = itsHalfIterations;
+        itsDecoder.itsDecodeCount = itsDecodes;
+    }
+
+    UncountedDecodes(const UncountedDecodes&) = delete;
+    UncountedDecodes& operator=(const UncountedDecodes&) = delete;
+
+private:
+    TDecoder& itsDecoder;
+    const std::uint64_t itsDecodes;
+    const std::uint64_t itsHalfIterations;
+    const std::uint32_t itsDumps;
+};
+
 }  // namespace
 
 LanePath::LanePath(TDecoder3GPU& decoder, lanes::Algorithm algorithm, const lanes::InstructionSet& instructionSet)
@@ -101,9 +129,7 @@ void LanePath::keepLast()
 void LanePath::catchUp()
 {
     keepLast();
-    const std::uint64_t decodes = itsDecoder.itsDecodeCount;
-    const std::uint64_t halfIterations = itsDecoder.itsHalfIterationCount;
-    const std::uint32_t dumps = std::exchange(itsDecoder.itsDumpCount, 0U);
+    const UncountedDecodes uncounted(itsDecoder);
     const unsigned shift = itsDecoder.itsEngine->itsStateFormat->itsShift;
     for (const Past& past : itsPast) {
         std::vector<short> soft;
@@ -116,7 +142,4 @@ void LanePath::catchUp()
         itsDecoder.decode(soft, hard, past.iterations);
     }
     itsPast.clear();
-    itsDecoder.itsDumpCount = dumps;
-    itsDecoder.itsHalfIterationCount = halfIterations;
-    itsDecoder.itsDecodeCount = decodes;
 }

@@ -90,7 +90,12 @@ template <class Input>
 Status runByLanes(State& state, const Batch<Input>& batch, Outputs& outputs)
 {
     const auto K = static_cast<std::size_t>(batch.dinSize - 4);
+    LanePath& path = *state.lane_path;
     if (const char* reason = shortArray(outputs, batch.blocks, K)) {
+        // As in the single call, room is what is looked at last: the first block is decoded and counts.
+        const lanes::Streams<Input> first = batch.block(0);
+        loadLanes(state, &first, 1, batch.dinSize, nullptr);
+        path.decode(batch.iterations);
         return refuse(reason);
     }
     std::vector<lanes::Streams<Input>> blocks;
@@ -101,7 +106,6 @@ Status runByLanes(State& state, const Batch<Input>& batch, Outputs& outputs)
         decisions.push_back(outputs.dout + b * K);
         ratios.push_back(outputs.ratios == nullptr ? nullptr : outputs.ratios + b * K);
     }
-    LanePath& path = *state.lane_path;
     for (std::uint32_t b = 0; b < batch.blocks;) {
         const std::uint32_t* tags = batch.tags == nullptr ? nullptr : batch.tags + b;
         const unsigned taken = loadLanes(state, &blocks[b], batch.blocks - b, batch.dinSize, tags);

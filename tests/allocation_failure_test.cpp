@@ -15,7 +15,6 @@
 #include <map>
 #include <new>
 #include <sstream>
-#include <streambuf>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -23,134 +22,9 @@
 
 #include "Misc.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
-
-// NOLINTBEGIN(bugprone-reserved-identifier): the linker chooses these names.
-extern "C" {
-void* __real_malloc(std::size_t size);
-void __real_free(void* memory);
-void* __wrap_malloc(std::size_t size);
-void __wrap_free(void* memory);
-}
-// NOLINTEND(bugprone-reserved-identifier)
+#include "support/FailingAllocation.h"
 
 namespace {
-
-unsigned untilFailure = 0;  // 0: none is to fail
-long liveBlocks = 0;
-
-void* take(std::size_t size)
-{
-    if (untilFailure > 0 && --untilFailure == 0) {
-        return nullptr;
-    }
-    void* const memory = __real_malloc(size > 0 ? size : 1);
-    liveBlocks += memory != nullptr ? 1 : 0;
-    return memory;
-}
-
-void give(void* memory)
-{
-    liveBlocks -= memory != nullptr ? 1 : 0;
-    __real_free(memory);
-}
-
-}  // namespace
-
-void* __wrap_malloc(std::size_t size)
-{
-    return take(size);
-}
-
-void __wrap_free(void* memory)
-{
-    give(memory);
-}
-
-void* operator new(std::size_t size)
-{
-    void* const memory = take(size);
-    if (memory == nullptr) {
-        throw std::bad_alloc();
-    }
-    return memory;
-}
-
-void operator delete(void* memory) noexcept
-{
-    give(memory);
-}
-
-void operator delete(void* memory, std::size_t) noexcept
-{
-    give(memory);
-}
-
-namespace {
-
-/// A stream buffer that needs no memory: it keeps the first characters and drops the rest.
-class FixedBuffer : public std::streambuf {
-public:
-    FixedBuffer()
-    {
-        setp(itsText, itsText + sizeof itsText);
-    }
-
-    std::string_view text() const
-    {
-        return {itsText, static_cast<std::size_t>(pptr() - pbase())};
-    }
-
-private:
-    int overflow(int c) override
-    {
-        return c;
-    }
-
-    char itsText[4096];
-};
-
-/// Collects the library's lines, and makes an allocation fail, while it lives.
-class FailingAllocation {
-public:
-    explicit FailingAllocation(unsigned which)
-        : itsCout(std::cout.rdbuf(&itsOut)), itsCerr(std::cerr.rdbuf(&itsErr)), itsLiveBlocks(liveBlocks)
-    {
-        untilFailure = which;
-    }
-
-    ~FailingAllocation()
-    {
-        untilFailure = 0;
-        std::cout.rdbuf(itsCout);
-        std::cerr.rdbuf(itsCerr);
-    }
-
-    FailingAllocation(const FailingAllocation&) = delete;
-    FailingAllocation& operator=(const FailingAllocation&) = delete;
-
-    /// Whether the call needed so many allocations at all.
-    static bool happened()
-    {
-        return untilFailure == 0;
-    }
-
-    std::string_view errors() const
-    {
-        return itsErr.text();
-    }
-
-    long leaked() const
-    {
-        return liveBlocks - itsLiveBlocks;
-    }
-
-private:
-    FixedBuffer itsOut;
-    FixedBuffer itsErr;
-    std::streambuf* itsCout;
-    std::streambuf* itsCerr;
-    long itsLiveBlocks;
-};
 
 using Parameters = std::map<std::string, std::string>;
 
@@ -272,14 +146,14 @@ TEST(AllocationFailure, OfADecodeLeavesAWorkingState)
             veltra_ip_morvik_v1_0_destroy_state(state);
             const std::vector<std::uint8_t> expected = block.bits;
 
-            const long live = liveBlocks;
+            const long live = blocksInUse();
             unsigned which = 1;
             while (which < manyAllocations && decodeWithFailure(which, traced, before, block, expected)) {
                 ++which;
             }
             EXPECT_GE(which, K == previous && traced == 0 ? 1U : 3U);  // all memory is kept for the next block
             EXPECT_LT(which, manyAllocations);
-            EXPECT_EQ(liveBlocks, live);
+            EXPECT_EQ(blocksInUse(), live);
         }
     }
 }

@@ -1,11 +1,13 @@
 // The lane-parallel decoder against the component path: every ratio, decision and extrinsic value.
+//
+// MORVIK_TEST_SEED and MORVIK_TEST_BLOCKS in the environment choose another, longer run.
 #include <gtest/gtest.h>
 
-#include <cstdlib>
+#include <algorithm>
+#include <array>
+#include <functional>
 #include <memory>
-#include <ostream>
 #include <string>
-#include <tuple>
 #include <vector>
 
 #include "../lanes/InstructionSets.h"
@@ -16,6 +18,7 @@
 #include "TInterleaver.h"
 #include "TNumberFormat.h"
 #include "support/Blocks.h"
+#include "support/Environment.h"
 
 namespace {
 
@@ -50,7 +53,7 @@ lanes::BlockCut cutOf(unsigned K, unsigned units, const TInterleaver& interleave
 {
     lanes::BlockCut cut;
     cut.blockSize = K;
-    cut.segments = segmentation::segmentCount(K, 4 * units);
+    cut.segments = segmentation::segmentCount(K, std::uint64_t{4} * units);
     cut.windowStart = segmentation::windowStarts(K / cut.segments);
     interleaver.calcInterleaver(cut.permutation, K);
     return cut;
@@ -101,6 +104,7 @@ std::vector<Results> componentResults(Components& components, const blocks::Bloc
 std::vector<Results> laneResults(LaneDecoder& decoder, const std::vector<blocks::Block>& blocks, unsigned passes)
 {
     std::vector<lanes::Streams<std::int32_t>> streams;
+    streams.reserve(blocks.size());
     std::vector<Results> all(blocks.size(), Results(decoder.blockCut().blockSize));
     for (const blocks::Block& block : blocks) {
         streams.push_back({block.sys.data(), block.par1.data(), block.par2.data()});
@@ -131,22 +135,167 @@ std::string nameOf(Algorithm algorithm)
     return "type " + std::to_string(static_cast<int>(algorithm));
 }
 
-class LaneDecoderTest : public testing::TestWithParam<const lanes::InstructionSet*> {};
+class LaneDecoderTest : public testing::TestWithParam<const lanes::InstructionSet*> {
+protected:
+    /// The lanes of the widest row.
+    static unsigned lanesOfRow()
+    {
+        return GetParam()->kernels[GetParam()->kernelCount - 1].lanes;
+    }
+
+    /// Decodes the blocks in lanes and by components, and compares every value of every pass.
+    static void compare(
+        unsigned K, unsigned units, Algorithm algorithm, const std::vector<blocks::Block>& blocks, unsigned passes)
+    {
+        Components components(units, algorithm);
+        LaneDecoder decoder(*GetParam(), algorithm, corrections);
+        decoder.setBlockCut(cutOf(K, units, *components.interleaver));
+        std::vector<std::vector<Results>> expected;
+        expected.reserve(blocks.size());
+        for (const blocks::Block& block : blocks) {
+            expected.push_back(componentResults(components, block, passes));
+        }
+        for (unsigned h = 1; h <= passes; ++h) {
+            const std::vector<Results> got = laneResults(decoder, blocks, h);
+            for (std::size_t i = 0; i < blocks.size(); ++i) {
+                SCOPED_TRACE("K " + std::to_string(K) + ", " + std::to_string(units) + " units, " + nameOf(algorithm) +
+                             ", block " + std::to_string(i) + ", passes " + std::to_string(h));
+                ASSERT_EQ(got[i].ratios, expected[i][h - 1].ratios);
+                ASSERT_EQ(got[i].joint, expected[i][h - 1].joint);
+                ASSERT_EQ(got[i].decisions, expected[i][h - 1].decisions);
+            }
+        }
+    }
+};
+
+constexpr Algorithm algorithms[] = {Algorithm::greatest, Algorithm::greatestScaled, Algorithm::corrected};
+
+void forEachStream(blocks::Block& block, const std::function<void(blocks::Stream&)>& change)
+{
+    for (blocks::Stream* stream : {&block.sys, &block.par1, &block.par2}) {
+        change(*stream);
+    }
+}
+
+blocks::Block clipped(blocks::Block block)
+{
+    forEachStream(block, [](blocks::Stream& stream) {
+        for (std::int32_t& value : stream) {
+            value = std::min(127, std::max(-128, value));
+        }
+    });
+    return block;
+}
+
+/// Uniform, extreme and small values, a code word with noise, and one that saturates.
+constexpr unsigned kinds = 5;
 
 blocks::Block blockOf(blocks::Random& random, unsigned K, unsigned kind)
 {
-    if (kind == 0) {
-        blocks::Block block = blocks::encode(blocks::randomBits(random, K), 8);
-        blocks::addNoise(random, 8, block);
-        for (blocks::Stream* stream : {&block.sys, &block.par1, &block.par2}) {
-            for (std::int32_t& value : *stream) {
-                value = std::min(127, std::max(-128, value));
-            }
-        }
-        return block;
+    if (kind >= 3) {
+        blocks::Block block = blocks::encode(blocks::randomBits(random, K), kind == 3 ? 8 : 100);
+        blocks::addNoise(random, kind == 3 ? 8 : 60, block);
+        return clipped(block);
     }
     const blocks::Values values[] = {blocks::Values::uniform, blocks::Values::extreme, blocks::Values::small};
-    return blocks::randomBlock(random, K, values[kind - 1]);
+    return blocks::randomBlock(random, K, values[kind]);
+}
+
+/// Each value as one of the format's extremes, by its sign.
+blocks::Block extremes(blocks::Block block)
+{
+    forEachStream(block, [](blocks::Stream& stream) {
+        for (std::int32_t& value : stream) {
+            value = value >= 0 ? 127 : -128;
+        }
+    });
+    return block;
+}
+
+/// Turns the signs of some streams' values, of all positions or of the tail alone.
+blocks::Block turned(blocks::Block block, unsigned streams, bool tailAlone)
+{
+    unsigned bit = 1;
+    forEachStream(block, [&](blocks::Stream& stream) {
+        if ((streams & bit) != 0) {
+            const auto first = tailAlone ? stream.end() - 4 : stream.begin();
+            std::transform(first, stream.end(), first, [](std::int32_t value) { return -1 - value; });
+        }
+        bit *= 2;
+    });
+    return block;
+}
+
+/// Bits that repeat after `period` positions.
+std::vector<int> periodicBits(unsigned K, unsigned period, unsigned pattern)
+{
+    std::vector<int> bits;
+    for (unsigned k = 0; k < K; ++k) {
+        bits.push_back(static_cast<int>(pattern >> k % period & 1U));
+    }
+    return bits;
+}
+
+/// Extremes whose signs repeat in each stream, whatever a code word would have there.
+blocks::Block periodicBlock(unsigned K, unsigned period, const std::array<unsigned, 3>& patterns)
+{
+    blocks::Block block;
+    unsigned s = 0;
+    forEachStream(block, [&](blocks::Stream& stream) {
+        for (const int bit : periodicBits(K + 4, period, patterns[s])) {
+            stream.push_back(bit != 0 ? 127 : -128);
+        }
+        ++s;
+    });
+    return block;
+}
+
+/// Blocks that drive metrics apart: saturated code words, with streams against what the code wants, in the
+/// whole block or in the tail alone, and extremes that repeat after 1 to 7 positions (the encoder's register
+/// repeats after 7).
+std::vector<blocks::Block> worstBlocks(blocks::Random& random, unsigned K)
+{
+    std::vector<blocks::Block> worst;
+    for (unsigned streams = 0; streams < 8; ++streams) {
+        for (const bool tailAlone : {false, true}) {
+            worst.push_back(turned(extremes(blocks::encode(blocks::randomBits(random, K), 1)), streams, tailAlone));
+        }
+    }
+    for (unsigned period = 1; period <= 7; ++period) {
+        const auto pattern = [&] {
+            return static_cast<unsigned>(random() % (1U << period));
+        };
+        worst.push_back(turned(extremes(blocks::encode(periodicBits(K, period, pattern()), 1)), 0, false));
+        worst.push_back(
+            turned(extremes(blocks::encode(periodicBits(K, period, 1), 1)), static_cast<unsigned>(random() % 8), true));
+        worst.push_back(periodicBlock(K, period, {pattern(), pattern(), pattern()}));
+    }
+    for (unsigned signs = 0; signs < 8; ++signs) {
+        worst.push_back(periodicBlock(K, 1, {signs & 1U, signs >> 1 & 1U, signs >> 2}));
+    }
+    return worst;
+}
+
+/// Ties: all values alike, and small, or 0 but for one.
+std::vector<blocks::Block> tiedBlocks(blocks::Random& random, unsigned K)
+{
+    std::vector<blocks::Block> tied;
+    for (const std::int32_t value : {0, 1, -1}) {
+        const blocks::Stream stream(K + 4, value);
+        tied.push_back({stream, stream, stream});
+    }
+    blocks::Block block = tied[0];
+    block.par1[random() % (K + 4)] = 127;
+    tied.push_back(block);
+    block.sys[random() % (K + 4)] = -128;
+    tied.push_back(block);
+    return tied;
+}
+
+/// The numbers of blocks at a row's edges: one, the row full, one more, and others that leave lanes over.
+std::vector<unsigned> batchSizes(unsigned capacity)
+{
+    return {1, capacity, capacity + 1, 3, 2 * capacity + 1};
 }
 
 TEST_P(LaneDecoderTest, EveryValueOfEveryPassIsThatOfTheComponents)
@@ -155,30 +304,66 @@ TEST_P(LaneDecoderTest, EveryValueOfEveryPassIsThatOfTheComponents)
     for (const unsigned K :
          {40U, 48U, 120U, 128U, 136U, 256U, 504U, 512U, 1024U, 1056U, 2048U, 2112U, 3136U, 6080U, 6144U}) {
         for (const unsigned units : {2U, 4U, 8U}) {
-            for (const Algorithm algorithm : {Algorithm::greatest, Algorithm::greatestScaled, Algorithm::corrected}) {
-                Components components(units, algorithm);
-                LaneDecoder decoder(*GetParam(), algorithm, corrections);
-                decoder.setBlockCut(cutOf(K, units, *components.interleaver));
-                const unsigned passes = 5;
+            for (const Algorithm algorithm : algorithms) {
                 std::vector<blocks::Block> blocks;
-                for (unsigned i = 0; i < 4; ++i) {
-                    blocks.push_back(blockOf(random, K, i));
+                for (unsigned kind = 0; kind < kinds; ++kind) {
+                    blocks.push_back(blockOf(random, K, kind));
                 }
-                std::vector<std::vector<Results>> expected;
-                for (const blocks::Block& block : blocks) {
-                    expected.push_back(componentResults(components, block, passes));
-                }
-                for (unsigned h = 1; h <= passes; ++h) {
-                    const std::vector<Results> got = laneResults(decoder, blocks, h);
-                    for (std::size_t i = 0; i < blocks.size(); ++i) {
-                        SCOPED_TRACE("K " + std::to_string(K) + ", " + std::to_string(units) + " units, " +
-                                     nameOf(algorithm) + ", kind " + std::to_string(i) + ", passes " +
-                                     std::to_string(h));
-                        ASSERT_EQ(got[i].ratios, expected[i][h - 1].ratios);
-                        ASSERT_EQ(got[i].joint, expected[i][h - 1].joint);
-                        ASSERT_EQ(got[i].decisions, expected[i][h - 1].decisions);
+                ASSERT_NO_FATAL_FAILURE(compare(K, units, algorithm, blocks, 5));
+            }
+        }
+    }
+}
+
+TEST_P(LaneDecoderTest, WorstBlocksAreDecodedAlike)
+{
+    blocks::Random random(2);
+    for (const unsigned K : {40U, 48U, 56U, 128U, 512U, 1056U, 6144U}) {
+        for (const Algorithm algorithm : algorithms) {
+            std::vector<blocks::Block> blocks = worstBlocks(random, K);
+            if (K > 1024) {
+                blocks.resize(16);
+            }
+            ASSERT_NO_FATAL_FAILURE(compare(K, K > 1024 ? 8 : 2, algorithm, blocks, K > 1024 ? 3 : 6));
+        }
+    }
+}
+
+TEST_P(LaneDecoderTest, TiesAreDecodedAlike)
+{
+    blocks::Random random(3);
+    for (const unsigned K : {40U, 48U, 264U, 2048U}) {
+        for (const Algorithm algorithm : algorithms) {
+            ASSERT_NO_FATAL_FAILURE(compare(K, 4, algorithm, tiedBlocks(random, K), 6));
+        }
+    }
+}
+
+/// Each block size with each number of units and each algorithm type, each of them with another number of
+/// blocks and passes. MORVIK_TEST_BLOCKS, other than 0, asks for all numbers of blocks with all of them.
+TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
+{
+    const unsigned seed = fromEnvironment("MORVIK_TEST_SEED", 4);
+    const bool all = fromEnvironment("MORVIK_TEST_BLOCKS", 0) != 0;
+    blocks::Random random(seed);
+    unsigned turn = seed;
+    for (const unsigned K : blocks::blockSizes()) {
+        for (const unsigned units : {2U, 4U, 8U}) {
+            const unsigned capacity =
+                std::max(1U, lanesOfRow() / segmentation::segmentCount(K, std::uint64_t{4} * units));
+            for (const Algorithm algorithm : algorithms) {
+                const std::vector<unsigned> sizes = batchSizes(capacity);
+                for (std::size_t i = 0; i < sizes.size(); ++i) {
+                    if (!all && i != turn % sizes.size()) {
+                        continue;
                     }
+                    std::vector<blocks::Block> blocks;
+                    for (unsigned b = 0; b < sizes[i]; ++b) {
+                        blocks.push_back(blockOf(random, K, (b + turn) % kinds));
+                    }
+                    ASSERT_NO_FATAL_FAILURE(compare(K, units, algorithm, blocks, all ? 4 : 2 + turn % 2));
                 }
+                ++turn;
             }
         }
     }

@@ -1,10 +1,14 @@
-// simulate_fuzz: any sequence of calls on one state: blocks that shrink and grow, refusals in
-// between, traces armed at any time. A block decodes alike before and after all of it.
+// simulate_fuzz: any sequence of calls on one state: blocks that shrink and grow, batches of them, refusals in
+// between, traces armed and the instruction set changed at any time. A block decodes alike before and after all
+// of it, and a batch like its blocks.
 #include <algorithm>
+#include <iterator>
 #include <limits>
+#include <string>
 #include <vector>
 
 #include "FuzzInput.h"
+#include "morvik_v1_0_batch.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
 namespace {
@@ -79,6 +83,116 @@ Bits decode(State* state, const Block& block, std::uint32_t room, std::uint32_t 
     return bits;
 }
 
+/// Two blocks, in turn, as soft values of one type.
+template <class Value>
+std::vector<Value> joined(const std::vector<std::int32_t>& first,
+                          const std::vector<std::int32_t>& second,
+                          unsigned count)
+{
+    std::vector<Value> values;
+    for (unsigned b = 0; b < count; ++b) {
+        const std::vector<std::int32_t>& block = b % 2 == 0 ? first : second;
+        std::transform(block.begin(), block.end(), std::back_inserter(values), [](std::int32_t value) {
+            return static_cast<Value>(value);
+        });
+    }
+    return values;
+}
+
+template <class Value>
+using Simulate = std::int32_t(State*,
+                              const Value*,
+                              const Value*,
+                              const Value*,
+                              std::int32_t,
+                              std::uint32_t,
+                              std::uint32_t,
+                              const std::uint32_t*,
+                              veltra_ip_morvik_v1_0_batch_outputs*);
+
+/// A batch of two blocks in turn, with room or without: each gives the same wherever it is, and the first what the
+/// single call makes of it.
+template <class Value>
+void decodeBatch(FuzzInput& input, State* state, const Block& one, Simulate<Value> simulate)
+{
+    Block other = one;
+    for (auto& stream : other.streams) {
+        std::reverse(stream.begin(), stream.end());
+    }
+    const unsigned count = input.below(40);
+    const bool ratiosToo = input.below(2) == 0;
+    const std::size_t size = one.streams[0].size();
+    const std::size_t K = size < 4 ? 0 : size - 4;
+    std::vector<Value> streams[3];
+    for (unsigned s = 0; s < 3; ++s) {
+        streams[s] = joined<Value>(one.streams[s], other.streams[s], count);
+        streams[s].resize(std::max<std::size_t>(streams[s].size(), 1));
+    }
+    Bits bits(count * K + 16, 0xEE);
+    std::vector<std::int16_t> ratios(count * K + 16, 12345);
+    std::vector<std::uint32_t> tags(count + 1, input.word());
+    veltra_ip_morvik_v1_0_batch_outputs outputs{};
+    outputs.dout = bits.data();
+    outputs.dout_alloc = input.below(4) == 0 ? input.word() % (count * K + 1) : count * K;
+    outputs.ratios = ratiosToo ? ratios.data() : nullptr;
+    outputs.ratios_alloc = input.below(4) == 0 ? input.word() % (count * K + 1) : count * K;
+    outputs.tags = tags.data();
+    outputs.tags_alloc = input.below(4) == 0 ? input.word() % (count + 1) : count;
+    outputs.dout_size = 12345;
+    const std::int32_t status = simulate(state,
+                                         streams[0].data(),
+                                         streams[1].data(),
+                                         streams[2].data(),
+                                         static_cast<std::int32_t>(size),
+                                         count,
+                                         one.iterations,
+                                         tags.data(),
+                                         &outputs);
+    require(std::count(bits.begin(), bits.end(), 0xEE) == static_cast<std::ptrdiff_t>(status == 0 ? 16 : bits.size()),
+            "all decisions of a batch are written, or none");
+    if (status != 0) {
+        require(status == 1 || status == 2, "a refusal has status 1 or 2");
+        require(outputs.dout_size == 12345, "a refusal leaves the record alone");
+        require(std::count(ratios.begin(), ratios.end(), 12345) == static_cast<std::ptrdiff_t>(ratios.size()),
+                "a refusal leaves the ratios alone");
+        return;
+    }
+    require(outputs.dout_size == (count == 0 ? 12345 : K), "a batch gives K decisions for each block");
+    for (std::size_t i = 0; i < count * K; ++i) {
+        require(bits[i] == bits[i % (2 * K)], "a block is decoded alike wherever it is");
+        require(!ratiosToo || bits[i] == (ratios[i] >= 0 ? 1 : 0), "ratios have the decisions' signs");
+    }
+    if (count > 0 && sizeof(Value) == 4) {
+        veltra_ip_morvik_v1_0_bitacc_dump_config(state, 0);
+        bits.resize(K);
+        require(decode(state, one, 8192, 0) == bits, "a batch decides like the single call");
+    }
+}
+
+void decodeBatch(FuzzInput& input, State* state, const Block& block)
+{
+    switch (input.below(3)) {
+    case 0:
+        return decodeBatch<std::int32_t>(input, state, block, veltra_ip_morvik_v1_0_batch_simulate_i32);
+    case 1:
+        return decodeBatch<std::int16_t>(input, state, block, veltra_ip_morvik_v1_0_batch_simulate_i16);
+    default:
+        return decodeBatch<std::int8_t>(input, state, block, veltra_ip_morvik_v1_0_batch_simulate_i8);
+    }
+}
+
+/// Any of the names; those that the machine lacks change nothing.
+void changeInstructionSet(FuzzInput& input, State* state)
+{
+    constexpr const char* names[] = {"component", "generic", "ssse3", "avx2", "avx512", "none"};
+    const char* const name = names[input.below(6)];
+    const std::string before = veltra_ip_morvik_v1_0_get_instruction_set(state);
+    const std::int32_t status = veltra_ip_morvik_v1_0_set_instruction_set(state, name);
+    require(status == 0 || status == 1, "the choice of an instruction set has status 0 or 1");
+    require(veltra_ip_morvik_v1_0_get_instruction_set(state) == (status == 0 ? name : before),
+            "the instruction set is the one that was chosen last");
+}
+
 /// 0 or less, down to the smallest integer.
 std::int32_t noSize(FuzzInput& input)
 {
@@ -121,7 +235,7 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
     for (unsigned calls = 0; calls < 8 && !input.empty(); ++calls) {
         veltra_ip_morvik_v1_0_bitacc_dump_config(state, input.below(8) == 0 ? input.below(4) : 0);
         Block block = takeBlock(input);
-        switch (input.below(6)) {
+        switch (input.below(8)) {
         case 0:
             callWithBadArgument(input, state, block);
             break;
@@ -131,6 +245,12 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
         case 2:
             block.iterations = input.below(2) == 0 ? 0 : 16 + input.word() % 0xFFFF0000U;
             require(decode(state, block, 8192, 0).empty(), "0 and more than 15 iterations are refused");
+            break;
+        case 6:
+            decodeBatch(input, state, block);
+            break;
+        case 7:
+            changeInstructionSet(input, state);
             break;
         default:
             decode(state, block, 8192, input.word());

@@ -1,0 +1,77 @@
+// Batches: calls of the batch interface for tests, for every type of soft values.
+#ifndef MORVIK_TESTS_BATCHES_H
+#define MORVIK_TESTS_BATCHES_H
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "Blocks.h"
+#include "morvik_v1_0_batch.h"
+
+namespace blocks {
+
+using State = veltra_ip_morvik_v1_0_state;
+using BatchOutputs = veltra_ip_morvik_v1_0_batch_outputs;
+
+/// The names of those that this machine has, the best first; `component` is the last.
+std::vector<std::string> instructionSets();
+
+/// Blocks of one size as the batch interface takes them.
+template <class Input>
+struct Batch {
+    std::vector<Input> sys;
+    std::vector<Input> par1;
+    std::vector<Input> par2;
+    std::int32_t dinSize = 0;
+    std::uint32_t count = 0;
+
+    Batch() = default;
+
+    /// Values that the type does not hold lose their upper bits.
+    explicit Batch(const std::vector<Block>& blocks);
+
+    /// One of its blocks, as the single call takes it.
+    Block block(std::size_t b) const;
+
+    std::int32_t simulate(State* state, unsigned iterations, const std::uint32_t* tags, BatchOutputs* outputs) const;
+};
+
+/// The function for a type of soft values.
+std::int32_t simulateBatch(State* state,
+                           const std::int32_t* const* streams,
+                           std::int32_t dinSize,
+                           std::uint32_t count,
+                           unsigned iterations,
+                           const std::uint32_t* tags,
+                           BatchOutputs* outputs);
+std::int32_t simulateBatch(State* state,
+                           const std::int16_t* const* streams,
+                           std::int32_t dinSize,
+                           std::uint32_t count,
+                           unsigned iterations,
+                           const std::uint32_t* tags,
+                           BatchOutputs* outputs);
+std::int32_t simulateBatch(State* state,
+                           const std::int8_t* const* streams,
+                           std::int32_t dinSize,
+                           std::uint32_t count,
+                           unsigned iterations,
+                           const std::uint32_t* tags,
+                           BatchOutputs* outputs);
+
+/// What some blocks give: one array of all blocks' values each.
+struct Decoded {
+    std::vector<std::uint8_t> bits;
+    std::vector<std::int16_t> ratios;
+    std::vector<std::uint32_t> tags;
+};
+
+/// The same blocks handed over one by one to a state whose components decode.
+template <class Input>
+Decoded decodedOneByOne(State* components, const Batch<Input>& batch, unsigned iterations, const std::uint32_t* tags);
+
+}  // namespace blocks
+
+#endif

@@ -1,0 +1,68 @@
+// FailingAllocation: makes a single allocation fail, for programs whose malloc and free are wrapped by the linker.
+#ifndef MORVIK_TESTS_FAILINGALLOCATION_H
+#define MORVIK_TESTS_FAILINGALLOCATION_H
+
+#include <iostream>
+#include <streambuf>
+#include <string_view>
+
+/// Blocks of memory that are in use.
+long blocksInUse();
+
+/// A stream buffer that needs no memory: it keeps the first characters and drops the rest.
+class FixedBuffer : public std::streambuf {
+public:
+    FixedBuffer()
+    {
+        setp(itsText, itsText + sizeof itsText);
+    }
+
+    std::string_view text() const
+    {
+        return {itsText, static_cast<std::size_t>(pptr() - pbase())};
+    }
+
+private:
+    int overflow(int c) override
+    {
+        return c;
+    }
+
+    char itsText[4096];
+};
+
+/// Collects the library's lines, and makes an allocation fail, while it lives.
+class FailingAllocation {
+public:
+    /// Counted from 1; 0: none is to fail.
+    explicit FailingAllocation(unsigned which);
+    ~FailingAllocation();
+
+    FailingAllocation(const FailingAllocation&) = delete;
+    FailingAllocation& operator=(const FailingAllocation&) = delete;
+
+    /// Whether the call needed so many allocations at all.
+    static bool happened();
+
+    std::string_view errors() const
+    {
+        return itsErr.text();
+    }
+
+    /// Whether a trace has begun.
+    bool traced() const
+    {
+        return !itsOut.text().empty();
+    }
+
+    long leaked() const;
+
+private:
+    FixedBuffer itsOut;
+    FixedBuffer itsErr;
+    std::streambuf* itsCout;
+    std::streambuf* itsCerr;
+    long itsLiveBlocks;
+};
+
+#endif
