@@ -1,0 +1,95 @@
+// Limits: what the probe shows to be possible on this machine, in this run.
+#include "Limits.h"
+
+#include <cstdint>
+
+#include "../lanes/InstructionSets.h"
+#include "../src/Segmentation.h"
+#include "Measure.h"
+#include "Probe.h"
+
+// One compilation of Probe.cpp defines each.
+namespace probe_generic {
+extern const bench::ProbeSet probeSet;
+}
+namespace probe_ssse3 {
+extern const bench::ProbeSet probeSet;
+}
+namespace probe_avx2 {
+extern const bench::ProbeSet probeSet;
+}
+namespace probe_avx512 {
+extern const bench::ProbeSet probeSet;
+}
+
+namespace bench {
+
+namespace {
+
+const ProbeSet* const probeSets[] = {
+    &probe_avx512::probeSet, &probe_avx2::probeSet, &probe_ssse3::probeSet, &probe_generic::probeSet};
+
+double cyclesOf(const Probe& probe)
+{
+    constexpr unsigned repetitions = 9;
+    constexpr unsigned rounds = 4000;
+    std::vector<double> cycles;
+    probe.run(rounds / 10);
+    for (unsigned i = 0; i < repetitions; ++i) {
+        const Stopwatch stopwatch;
+        probe.run(rounds);
+        cycles.push_back(stopwatch.stop(double{rounds} * Probe::steps).cycles);
+    }
+    return median(cycles) * 16 / probe.lanes;
+}
+
+const lanes::InstructionSet* instructionSet(const std::string& name)
+{
+    for (const lanes::InstructionSet* set : lanes::availableInstructionSets()) {
+        if (set->name == name) {
+            return set;
+        }
+    }
+    return nullptr;
+}
+
+/// Lanes of the vectors that the work is done on: those of the narrowest kernel that has room for all
+/// segments, or of the widest one.
+unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
+{
+    constexpr std::uint64_t threads = 4;  // of each processing unit
+    const unsigned segments = segmentation::segmentCount(work.blockSize, threads * static_cast<unsigned>(work.units));
+    const unsigned wanted = segments * (work.call == Work::Call::batch ? work.blocks : 1);
+    unsigned i = 0;
+    while (i + 1 < set.kernelCount && set.kernels[i].lanes < wanted) {
+        ++i;
+    }
+    return set.kernels[i].vectorLanes;
+}
+
+}  // namespace
+
+Limits::Limits()
+{
+    for (const ProbeSet* set : probeSets) {
+        for (unsigned i = 0; instructionSet(set->name) != nullptr && i < set->count; ++i) {
+            itsLimits.push_back({set->name, set->probes[i].lanes, cyclesOf(set->probes[i])});
+        }
+    }
+}
+
+double Limits::cyclesPerStep(const Work& work) const
+{
+    const lanes::InstructionSet* const set = instructionSet(work.instructionSet);
+    if (set == nullptr) {
+        return 0;
+    }
+    for (const Limit& limit : itsLimits) {
+        if (limit.instructionSet == set->name && limit.lanes == vectorLanes(work, *set)) {
+            return limit.cycles;
+        }
+    }
+    return 0;
+}
+
+}  // namespace bench
