@@ -1,6 +1,7 @@
 // Limits: what the probe shows to be possible on this machine, in this run.
 #include "Limits.h"
 
+#include <cstddef>
 #include <cstdint>
 
 #include "../lanes/InstructionSets.h"
@@ -31,16 +32,11 @@ const ProbeSet* const probeSets[] = {
 
 double cyclesOf(const Probe& probe)
 {
-    constexpr unsigned repetitions = 9;
     constexpr unsigned rounds = 4000;
-    std::vector<double> cycles;
     probe.run(rounds / 10);
-    for (unsigned i = 0; i < repetitions; ++i) {
-        const Stopwatch stopwatch;
-        probe.run(rounds);
-        cycles.push_back(stopwatch.stop(double{rounds} * Probe::steps).cycles);
-    }
-    return median(cycles) * 16 / probe.lanes;
+    const Stopwatch stopwatch;
+    probe.run(rounds);
+    return stopwatch.stop(double{rounds} * Probe::steps).cycles * 16 / probe.lanes;
 }
 
 const lanes::InstructionSet* instructionSet(const std::string& name)
@@ -69,12 +65,25 @@ unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
 
 }  // namespace
 
+/// The probes take turns, so that what disturbs the machine for a moment spoils few samples of each.
 Limits::Limits()
 {
+    constexpr unsigned repetitions = 9;
+    std::vector<const Probe*> probes;
     for (const ProbeSet* set : probeSets) {
         for (unsigned i = 0; instructionSet(set->name) != nullptr && i < set->count; ++i) {
-            itsLimits.push_back({set->name, set->probes[i].lanes, cyclesOf(set->probes[i])});
+            probes.push_back(&set->probes[i]);
+            itsLimits.push_back({set->name, set->probes[i].lanes, 0});
         }
+    }
+    std::vector<std::vector<double>> cycles(probes.size());
+    for (unsigned repetition = 0; repetition < repetitions; ++repetition) {
+        for (std::size_t i = 0; i < probes.size(); ++i) {
+            cycles[i].push_back(cyclesOf(*probes[i]));
+        }
+    }
+    for (std::size_t i = 0; i < probes.size(); ++i) {
+        itsLimits[i].cycles = median(cycles[i]);
     }
 }
 

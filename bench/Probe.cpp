@@ -1,6 +1,8 @@
 // Probe: the plain forward recursion; compiled once for each instruction set, as lanes/Kernels.cpp is.
 #include "Probe.h"
 
+#include <cstddef>
+
 #include "../lanes/Words.h"
 #include "../src/Trellis.h"
 #include "../src/TrellisDecision.h"
@@ -8,7 +10,7 @@
 namespace MORVIK_LANES {
 namespace {
 
-constexpr unsigned states = trellis::stateCount;
+constexpr std::size_t states = trellis::stateCount;
 
 template <unsigned count>
 struct Loop {
@@ -18,7 +20,7 @@ struct Loop {
     /// A slot for each step: its eight forward metrics and two branch metrics, each of which serves two
     /// pairs of states, because LTE has no second parity stream. Side by side, a step's loads never look
     /// to the processor like another step's stores, at an address that is equal in the low 12 bits.
-    static constexpr unsigned slot = (states + 2) * count;
+    static constexpr std::size_t slot = (states + 2) * count;
     alignas(64) static inline std::int16_t slots[bench::Probe::steps * slot];
 
     static __attribute__((flatten, noinline)) void run(unsigned rounds)

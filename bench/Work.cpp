@@ -63,7 +63,9 @@ std::vector<Work> allWork()
             all.push_back({6144, units, 1, Call::single, sets[lesser]->name, 1});
         }
     }
-    all.push_back({6144, 4, 1, Call::single, "component", 1});
+    for (const int algorithm : {0, 1, 2}) {
+        all.push_back({6144, 4, algorithm, Call::single, "component", 1});
+    }
     addComparison(all, sets.front()->name);
     return all;
 }
