@@ -1,4 +1,4 @@
-// Clock: processor time of this thread, in cycles.
+// Clock: processor time of this thread, and how many cycles a second of it has.
 #ifndef MORVIK_BENCH_CLOCK_H
 #define MORVIK_BENCH_CLOCK_H
 
@@ -15,7 +15,8 @@ inline double processorTime()
     return static_cast<double>(time.tv_sec) + 1e-9 * static_cast<double>(time.tv_nsec);
 }
 
-/// Cycles a second, by a chain of additions that each wait for the one before: one cycle for each.
+/// Cycles a second, by a chain of additions that each wait for the one before: one cycle for each. They
+/// add registers, because some processors add constants while they rename registers, at no cost.
 inline double cyclesPerSecond()
 {
     constexpr unsigned rounds = 40000;
@@ -23,10 +24,32 @@ inline double cyclesPerSecond()
     const double start = processorTime();
     std::uintptr_t chain = 1;
     for (unsigned i = 0; i < rounds; ++i) {
-        asm volatile(".rept 100\n\tadd $1, %0\n\t.endr" : "+r"(chain));
+        asm volatile(".rept 100\n\tadd %0, %0\n\t.endr" : "+r"(chain)::"cc");
     }
     return double{rounds} * additions / (processorTime() - start);
 }
+
+/// What one call took.
+struct Sample {
+    double seconds;
+    double cycles;
+};
+
+/// Measures some calls; the clock is measured just before and just after them.
+class Stopwatch {
+public:
+    Stopwatch() : itsClock(cyclesPerSecond()), itsStart(processorTime()) {}
+
+    Sample stop(double calls) const
+    {
+        const double seconds = (processorTime() - itsStart) / calls;
+        return {seconds, seconds * (itsClock + cyclesPerSecond()) / 2};
+    }
+
+private:
+    double itsClock;
+    double itsStart;
+};
 
 }  // namespace bench
 

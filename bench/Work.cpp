@@ -1,149 +1,92 @@
 // Work: the decoding that is measured.
 #include "Work.h"
 
-#include <algorithm>
-#include <cmath>
-#include <stdexcept>
+#include <cstddef>
+#include <utility>
 
-#include "support/Blocks.h"
+#include "../lanes/InstructionSets.h"
+#include "ItppDecoding.h"
+#include "MorvikDecoding.h"
 
 namespace bench {
 
 namespace {
 
-/// Soft values for amplitude 1: 8 steps to one and the channel's 2 / sigma^2 would be exact; this is a
-/// usual quantiser.
-constexpr int amplitude = 10;
+using Call = Work::Call;
 
-std::vector<std::string> instructionSets()
+/// Every number of units and algorithm type on the longest block, then short blocks.
+void addBest(std::vector<Work>& all, const std::string& best)
 {
-    std::vector<std::string> sets;
-    veltra_ip_morvik_v1_0_state* const state =
-        veltra_ip_morvik_v1_0_create_state(veltra_ip_morvik_v1_0_get_default_generics());
-    const std::string best = veltra_ip_morvik_v1_0_get_instruction_set(state);
-    bool reached = false;
-    for (const char* name : {"avx512", "avx2", "ssse3", "generic"}) {
-        reached = reached || name == best;
-        if (reached) {
-            sets.push_back(name);
+    for (const Call call : {Call::single, Call::batch}) {
+        for (const int algorithm : {0, 1, 2}) {
+            for (const int units : {2, 4, 8}) {
+                all.push_back({6144, units, algorithm, call, best, call == Call::single ? 1U : 16U});
+            }
         }
     }
-    veltra_ip_morvik_v1_0_destroy_state(state);
-    return sets;
+    all.push_back({512, 4, 1, Call::batch, best, 64});
+    all.push_back({40, 4, 1, Call::batch, best, 256});
+    all.push_back({40, 4, 1, Call::single, best, 1});
+}
+
+void addComparison(std::vector<Work>& all, const std::string& best)
+{
+    for (const auto& [K, blocks] : {std::pair{6144U, 16U}, std::pair{512U, 64U}}) {
+        all.push_back({K, 4, 0, Call::batch, best, blocks, Work::Decoder::morvik, true});
+        all.push_back({K, 4, 0, Call::single, best, blocks, Work::Decoder::morvik, true});
+        if (itppAvailable()) {
+            all.push_back({K, 0, 0, Call::single, "", blocks, Work::Decoder::itpp, true});
+        }
+    }
 }
 
 }  // namespace
 
 std::string Work::name() const
 {
-    return "K=" + std::to_string(blockSize) + "/units=" + std::to_string(units) + "/type=" + std::to_string(algorithm) +
-           "/blocks=" + std::to_string(blocks) + "/iterations=" + std::to_string(iterations) + "/" +
-           (instructionSet.empty() ? "best" : instructionSet);
+    const std::string size = "K=" + std::to_string(blockSize);
+    const std::string calls = call == Call::single ? "/single" : "/batch";
+    if (decoder == Decoder::itpp) {
+        return "compare/" + size + calls + "/itpp";
+    }
+    return (compared ? "compare/" + size : size) + calls + "/units=" + std::to_string(units) +
+           "/type=" + std::to_string(algorithm) + "/" + instructionSet;
 }
 
 std::vector<Work> allWork()
 {
+    const std::vector<const lanes::InstructionSet*> sets = lanes::availableInstructionSets();
     std::vector<Work> all;
+    addBest(all, sets.front()->name);
+    for (std::size_t lesser = 1; lesser < sets.size(); ++lesser) {
+        for (const int units : {4, 8}) {
+            all.push_back({6144, units, 1, Call::single, sets[lesser]->name, 1});
+        }
+    }
     for (const int algorithm : {0, 1, 2}) {
-        for (const int units : {2, 4, 8}) {
-            all.push_back({6144, units, algorithm, 1, 6, ""});
-        }
-        for (const int units : {2, 4, 8}) {
-            all.push_back({6144, units, algorithm, 16, 6, ""});
-        }
+        all.push_back({6144, 4, algorithm, Call::single, "component", 1});
     }
-    all.push_back({512, 4, 1, 64, 6, ""});
-    all.push_back({40, 4, 1, 256, 6, ""});
-    all.push_back({40, 4, 1, 1, 6, ""});
-    const std::vector<std::string> sets = instructionSets();
-    for (auto set = sets.begin() + 1; set < sets.end(); ++set) {
-        all.push_back({6144, 4, 1, 1, 6, *set});
-        all.push_back({6144, 8, 1, 1, 6, *set});
-    }
-    all.push_back({6144, 4, 1, 1, 6, "component"});
+    addComparison(all, sets.front()->name);
     return all;
 }
 
-Decoding::Decoding(const Work& work) : itsWork(work)
+Decoding::Decoding(const Work& work)
+    : itsWork(work), itsBlocks(noisyBlocks(work.blockSize, work.blocks)), itsDecisions(itsBlocks.sent.size())
 {
-    veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
-    generics.C_NUM_PU = work.units;
-    generics.C_ALGORITHM_TYPE = work.algorithm;
-    itsState = veltra_ip_morvik_v1_0_create_state(generics);
-    if (itsState == nullptr) {
-        throw std::runtime_error("no decoder state");
-    }
-    if (!work.instructionSet.empty()) {
-        veltra_ip_morvik_v1_0_set_instruction_set(itsState, work.instructionSet.c_str());
-    }
-    blocks::Random random(work.blockSize);
-    const double deviation = amplitude * std::sqrt(3.0 / 2.0 * std::pow(10.0, -0.1));
-    for (unsigned b = 0; b < work.blocks; ++b) {
-        const std::vector<int> bits = blocks::randomBits(random, work.blockSize);
-        blocks::Block block = blocks::encode(bits, amplitude);
-        blocks::addNoise(random, deviation, block);
-        itsSent.insert(itsSent.end(), bits.begin(), bits.end());
-        unsigned s = 0;
-        for (const blocks::Stream* stream : {&block.sys, &block.par1, &block.par2}) {
-            for (const std::int32_t value : *stream) {
-                itsStreams[s].push_back(std::clamp(value, -128, 127));
-            }
-            ++s;
-        }
-    }
-    itsDecisions.resize(itsSent.size());
-}
-
-Decoding::~Decoding()
-{
-    veltra_ip_morvik_v1_0_destroy_state(itsState);
-}
-
-bool Decoding::run()
-{
-    const auto size = static_cast<std::int32_t>(itsWork.blockSize + 4);
-    if (itsWork.blocks == 1) {
-        veltra_ip_morvik_v1_0_outputs outputs = {itsDecisions.data(), itsWork.blockSize, 0, 0};
-        return veltra_ip_morvik_v1_0_bitacc_simulate(itsState,
-                                                     itsStreams[0].data(),
-                                                     itsStreams[1].data(),
-                                                     itsStreams[2].data(),
-                                                     size,
-                                                     itsWork.iterations,
-                                                     0,
-                                                     &outputs) == 0;
-    }
-    veltra_ip_morvik_v1_0_batch_outputs outputs = {};
-    outputs.dout = itsDecisions.data();
-    outputs.dout_alloc = itsDecisions.size();
-    return veltra_ip_morvik_v1_0_batch_simulate_i32(itsState,
-                                                    itsStreams[0].data(),
-                                                    itsStreams[1].data(),
-                                                    itsStreams[2].data(),
-                                                    size,
-                                                    itsWork.blocks,
-                                                    itsWork.iterations,
-                                                    nullptr,
-                                                    &outputs) == 0;
-}
-
-double Decoding::bits() const
-{
-    return static_cast<double>(itsSent.size());
 }
 
 double Decoding::bitErrorRate() const
 {
-    double errors = 0;
-    for (std::size_t i = 0; i < itsSent.size(); ++i) {
-        errors += itsSent[i] != itsDecisions[i] ? 1 : 0;
+    std::size_t errors = 0;
+    for (std::size_t i = 0; i < itsDecisions.size(); ++i) {
+        errors += itsDecisions[i] != itsBlocks.sent[i] ? 1U : 0U;
     }
-    return errors / bits();
+    return static_cast<double>(errors) / static_cast<double>(itsDecisions.size());
 }
 
-const char* Decoding::instructionSet() const
+std::unique_ptr<Decoding> makeDecoding(const Work& work)
 {
-    return veltra_ip_morvik_v1_0_get_instruction_set(itsState);
+    return work.decoder == Work::Decoder::itpp ? makeItppDecoding(work) : makeMorvikDecoding(work);
 }
 
 }  // namespace bench

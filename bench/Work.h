@@ -3,54 +3,66 @@
 #define MORVIK_BENCH_WORK_H
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
-#include "morvik_v1_0_batch.h"
+#include "NoisyBlocks.h"
 
 namespace bench {
 
-/// One line of the table.
+/// Full iterations of every line.
+constexpr unsigned iterations = 6;
+
+/// One line of a table.
 struct Work {
+    enum class Decoder { morvik, itpp };
+    enum class Call { single, batch };
+
     unsigned blockSize;
-    int units;
-    int algorithm;
-    unsigned blocks;  ///< in one call; 1 takes the single call, more the batch
-    unsigned iterations;
-    std::string instructionSet;  ///< a name of the batch header, or "" for the best one
+    int units;      ///< of morvik, as the next three
+    int algorithm;  ///< type 0, 1 or 2
+    Call call;
+    std::string instructionSet;  ///< a name of the batch header
+    unsigned blocks;             ///< that are decoded at a time
+    Decoder decoder = Decoder::morvik;
+    bool compared = false;  ///< belongs to the comparison of decoders
 
     std::string name() const;
+
+    /// How many calls a run makes.
+    unsigned calls() const
+    {
+        return call == Call::batch ? 1 : blocks;
+    }
 };
 
-/// The lines of the table, for the instruction sets that this machine has.
+/// The lines of all tables, in order, for the instruction sets that this machine has.
 std::vector<Work> allWork();
 
-/// A decoder and noisy codewords of Eb/N0 about 1 dB for it, the soft values 32-bit integers.
+/// A decoder and the blocks that it is to decode.
 class Decoding {
 public:
-    explicit Decoding(const Work& work);
-    ~Decoding();
+    virtual ~Decoding() = default;
     Decoding(const Decoding&) = delete;
     Decoding& operator=(const Decoding&) = delete;
 
-    /// Decodes all blocks once; false when the library refuses.
-    bool run();
+    /// Decodes all blocks once.
+    virtual void run() = 0;
 
-    /// Information bits that a run decodes.
-    double bits() const;
-
-    /// Share of the bits that differ from the ones sent.
+    /// Share of the decided bits that differ from the ones sent.
     double bitErrorRate() const;
 
-    const char* instructionSet() const;
+protected:
+    explicit Decoding(const Work& work);
 
-private:
     const Work itsWork;
-    veltra_ip_morvik_v1_0_state* itsState;
-    std::vector<std::int32_t> itsStreams[3];
-    std::vector<std::uint8_t> itsSent;
-    std::vector<std::uint8_t> itsDecisions;
+    const NoisyBlocks itsBlocks;
+    std::vector<std::uint8_t> itsDecisions;  ///< block after block
 };
+
+/// Throws when the work cannot be done.
+std::unique_ptr<Decoding> makeDecoding(const Work& work);
 
 }  // namespace bench
 

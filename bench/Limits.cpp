@@ -1,0 +1,104 @@
+// Limits: what the probe shows to be possible on this machine, in this run.
+#include "Limits.h"
+
+#include <cstddef>
+#include <cstdint>
+
+#include "../lanes/InstructionSets.h"
+#include "../src/Segmentation.h"
+#include "Measure.h"
+#include "Probe.h"
+
+// One compilation of Probe.cpp defines each.
+namespace probe_generic {
+extern const bench::ProbeSet probeSet;
+}
+namespace probe_ssse3 {
+extern const bench::ProbeSet probeSet;
+}
+namespace probe_avx2 {
+extern const bench::ProbeSet probeSet;
+}
+namespace probe_avx512 {
+extern const bench::ProbeSet probeSet;
+}
+
+namespace bench {
+
+namespace {
+
+const ProbeSet* const probeSets[] = {
+    &probe_avx512::probeSet, &probe_avx2::probeSet, &probe_ssse3::probeSet, &probe_generic::probeSet};
+
+double cyclesOf(const Probe& probe)
+{
+    constexpr unsigned rounds = 4000;
+    probe.run(rounds / 10);
+    const Stopwatch stopwatch;
+    probe.run(rounds);
+    return stopwatch.stop(double{rounds} * Probe::steps).cycles * 16 / probe.lanes;
+}
+
+const lanes::InstructionSet* instructionSet(const std::string& name)
+{
+    for (const lanes::InstructionSet* set : lanes::availableInstructionSets()) {
+        if (set->name == name) {
+            return set;
+        }
+    }
+    return nullptr;
+}
+
+/// Lanes of the vectors that the work is done on: those of the narrowest kernel that has room for all
+/// segments, or of the widest one.
+unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
+{
+    constexpr std::uint64_t threads = 4;  // of each processing unit
+    const unsigned segments = segmentation::segmentCount(work.blockSize, threads * static_cast<unsigned>(work.units));
+    const unsigned wanted = segments * (work.call == Work::Call::batch ? work.blocks : 1);
+    unsigned i = 0;
+    while (i + 1 < set.kernelCount && set.kernels[i].lanes < wanted) {
+        ++i;
+    }
+    return set.kernels[i].vectorLanes;
+}
+
+}  // namespace
+
+/// The probes take turns, so that what disturbs the machine for a moment spoils few samples of each.
+Limits::Limits()
+{
+    constexpr unsigned repetitions = 9;
+    std::vector<const Probe*> probes;
+    for (const ProbeSet* set : probeSets) {
+        for (unsigned i = 0; instructionSet(set->name) != nullptr && i < set->count; ++i) {
+            probes.push_back(&set->probes[i]);
+            itsLimits.push_back({set->name, set->probes[i].lanes, 0});
+        }
+    }
+    std::vector<std::vector<double>> cycles(probes.size());
+    for (unsigned repetition = 0; repetition < repetitions; ++repetition) {
+        for (std::size_t i = 0; i < probes.size(); ++i) {
+            cycles[i].push_back(cyclesOf(*probes[i]));
+        }
+    }
+    for (std::size_t i = 0; i < probes.size(); ++i) {
+        itsLimits[i].cycles = median(cycles[i]);
+    }
+}
+
+double Limits::cyclesPerStep(const Work& work) const
+{
+    const lanes::InstructionSet* const set = instructionSet(work.instructionSet);
+    if (set == nullptr) {
+        return 0;
+    }
+    for (const Limit& limit : itsLimits) {
+        if (limit.instructionSet == set->name && limit.lanes == vectorLanes(work, *set)) {
+            return limit.cycles;
+        }
+    }
+    return 0;
+}
+
+}  // namespace bench

@@ -1,0 +1,55 @@
+// Measure: from samples to the figures of a line.
+#include "Measure.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+namespace bench {
+
+double median(std::vector<double> values)
+{
+    std::sort(values.begin(), values.end());
+    const std::size_t half = values.size() / 2;
+    return values.size() % 2 != 0 ? values[half] : (values[half - 1] + values[half]) / 2;
+}
+
+Figures figures(const Work& work, const Decoding& decoding, const Sample& sample, double limit)
+{
+    // A bit takes a step of two passes in each iteration, and a probe's step is that of 16 lanes.
+    constexpr double passes = 2;
+    constexpr double lanes = 16;
+    const double bits = 1.0 * work.blocks * work.blockSize;
+    const double cycles = sample.cycles / bits / iterations;
+    return {bits / sample.seconds * 1e-6,
+            cycles,
+            sample.seconds / work.calls() * 1e6,
+            limit == 0 ? 0 : cycles / passes * lanes / limit,
+            decoding.bitErrorRate()};
+}
+
+Figures medians(const std::vector<Figures>& all)
+{
+    const auto of = [&all](double Figures::*figure) {
+        std::vector<double> values;
+        values.reserve(all.size());
+        for (const Figures& one : all) {
+            values.push_back(one.*figure);
+        }
+        return median(values);
+    };
+    return {of(&Figures::megabitsPerSecond),
+            of(&Figures::cyclesPerBitAndIteration),
+            of(&Figures::latency),
+            of(&Figures::ratio),
+            of(&Figures::bitErrorRate)};
+}
+
+void checkDecisions(const Work& work, double bitErrorRate)
+{
+    if (bitErrorRate > 0.1) {
+        throw std::runtime_error(work.name() + ": the decoder decides wrongly, bit error rate " +
+                                 std::to_string(bitErrorRate));
+    }
+}
+
+}  // namespace bench

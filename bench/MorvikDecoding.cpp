@@ -1,0 +1,103 @@
+// MorvikDecoding: the library at work, through its C interfaces.
+#include "MorvikDecoding.h"
+
+#include <cstddef>
+#include <stdexcept>
+
+#include "morvik_v1_0_batch.h"
+
+namespace bench {
+
+namespace {
+
+struct DestroyState {
+    void operator()(veltra_ip_morvik_v1_0_state* state) const
+    {
+        veltra_ip_morvik_v1_0_destroy_state(state);
+    }
+};
+
+class MorvikDecoding : public Decoding {
+public:
+    explicit MorvikDecoding(const Work& work) : Decoding(work)
+    {
+        veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
+        generics.C_NUM_PU = work.units;
+        generics.C_ALGORITHM_TYPE = work.algorithm;
+        itsState.reset(veltra_ip_morvik_v1_0_create_state(generics));
+        if (itsState == nullptr ||
+            veltra_ip_morvik_v1_0_set_instruction_set(itsState.get(), work.instructionSet.c_str()) != 0) {
+            throw std::runtime_error(work.name() + ": no such decoder");
+        }
+    }
+
+    void run() override
+    {
+        if (itsWork.call == Work::Call::batch) {
+            runBatch();
+            return;
+        }
+        for (unsigned block = 0; block < itsWork.blocks; ++block) {
+            runSingle(block);
+        }
+    }
+
+private:
+    std::int32_t positions() const
+    {
+        return static_cast<std::int32_t>(itsWork.blockSize + 4);
+    }
+
+    const std::int32_t* stream(unsigned s, unsigned block) const
+    {
+        return itsBlocks.streams[s].data() + std::size_t{block} * (itsWork.blockSize + 4);
+    }
+
+    void runSingle(unsigned block)
+    {
+        veltra_ip_morvik_v1_0_outputs outputs = {
+            itsDecisions.data() + std::size_t{block} * itsWork.blockSize, itsWork.blockSize, 0, 0};
+        check(veltra_ip_morvik_v1_0_bitacc_simulate(itsState.get(),
+                                                    stream(0, block),
+                                                    stream(1, block),
+                                                    stream(2, block),
+                                                    positions(),
+                                                    iterations,
+                                                    0,
+                                                    &outputs));
+    }
+
+    void runBatch()
+    {
+        veltra_ip_morvik_v1_0_batch_outputs outputs = {};
+        outputs.dout = itsDecisions.data();
+        outputs.dout_alloc = itsDecisions.size();
+        check(veltra_ip_morvik_v1_0_batch_simulate_i32(itsState.get(),
+                                                       stream(0, 0),
+                                                       stream(1, 0),
+                                                       stream(2, 0),
+                                                       positions(),
+                                                       itsWork.blocks,
+                                                       iterations,
+                                                       nullptr,
+                                                       &outputs));
+    }
+
+    void check(std::int32_t status) const
+    {
+        if (status != 0) {
+            throw std::runtime_error(itsWork.name() + ": status " + std::to_string(status));
+        }
+    }
+
+    std::unique_ptr<veltra_ip_morvik_v1_0_state, DestroyState> itsState;
+};
+
+}  // namespace
+
+std::unique_ptr<Decoding> makeMorvikDecoding(const Work& work)
+{
+    return std::make_unique<MorvikDecoding>(work);
+}
+
+}  // namespace bench

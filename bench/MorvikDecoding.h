@@ -1,0 +1,13 @@
+// MorvikDecoding: the library at work, through its C interfaces.
+#ifndef MORVIK_BENCH_MORVIKDECODING_H
+#define MORVIK_BENCH_MORVIKDECODING_H
+
+#include "Work.h"
+
+namespace bench {
+
+std::unique_ptr<Decoding> makeMorvikDecoding(const Work& work);
+
+}  // namespace bench
+
+#endif

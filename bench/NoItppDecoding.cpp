@@ -1,0 +1,18 @@
+// NoItppDecoding: in the place of ItppDecoding where IT++ is not installed.
+#include <stdexcept>
+
+#include "ItppDecoding.h"
+
+namespace bench {
+
+bool itppAvailable()
+{
+    return false;
+}
+
+std::unique_ptr<Decoding> makeItppDecoding(const Work& work)
+{
+    throw std::runtime_error(work.name() + ": built without IT++");
+}
+
+}  // namespace bench

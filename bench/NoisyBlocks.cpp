@@ -1,0 +1,50 @@
+// NoisyBlocks: the code blocks that all decoders are measured on.
+#include "NoisyBlocks.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "support/Blocks.h"
+
+namespace bench {
+
+namespace {
+
+/// Of a soft value without noise, in steps: a received amplitude of 1.25.
+constexpr int amplitude = 10;
+
+NoisyBlocks makeBlocks(unsigned K, unsigned count, double deviation)
+{
+    NoisyBlocks made;
+    blocks::Random random(K);
+    for (unsigned i = 0; i < count; ++i) {
+        const std::vector<int> bits = blocks::randomBits(random, K);
+        blocks::Block block = blocks::encode(bits, amplitude);
+        blocks::addNoise(random, deviation, block);
+        made.sent.insert(made.sent.end(), bits.begin(), bits.end());
+        unsigned s = 0;
+        for (const blocks::Stream* stream : {&block.sys, &block.par1, &block.par2}) {
+            for (const std::int32_t value : *stream) {
+                made.streams[s].push_back(std::clamp(value, -128, 127));
+            }
+            ++s;
+        }
+    }
+    return made;
+}
+
+}  // namespace
+
+NoisyBlocks noisyBlocks(unsigned K, unsigned count)
+{
+    // sigma^2 = 1 / (2 R Eb/N0) for the rate R = 1/3 and antipodal signals.
+    constexpr double decibels = 1.0;
+    return makeBlocks(K, count, amplitude * std::sqrt(3.0 / 2.0 * std::pow(10.0, -decibels / 10.0)));
+}
+
+NoisyBlocks cleanBlocks(unsigned K, unsigned count)
+{
+    return makeBlocks(K, count, 0.0);
+}
+
+}  // namespace bench

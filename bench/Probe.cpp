@@ -1,0 +1,59 @@
+// Probe: the plain forward recursion; compiled once for each instruction set, as lanes/Kernels.cpp is.
+#include "Probe.h"
+
+#include <cstddef>
+
+#include "../lanes/Words.h"
+#include "../src/Trellis.h"
+#include "../src/TrellisDecision.h"
+
+namespace MORVIK_LANES {
+namespace {
+
+constexpr std::size_t states = trellis::stateCount;
+
+template <unsigned count>
+struct Loop {
+    using Value = Steps<count>;
+    using Decision = trellis::DecideMax<Value>;
+
+    /// A slot for each step: its eight forward metrics and two branch metrics, each of which serves two
+    /// pairs of states, because LTE has no second parity stream. Side by side, a step's loads never look
+    /// to the processor like another step's stores, at an address that is equal in the low 12 bits.
+    static constexpr std::size_t slot = (states + 2) * count;
+    alignas(64) static inline std::int16_t slots[bench::Probe::steps * slot];
+
+    static __attribute__((flatten, noinline)) void run(unsigned rounds)
+    {
+        for (unsigned round = 0; round < rounds; ++round) {
+            asm volatile("" ::"r"(slots) : "memory");  // as if somebody else filled and read them
+            trellis::Column<Decision> a{};
+            for (std::int16_t* to = slots; to != slots + bench::Probe::steps * slot; to += slot) {
+                const Value g0 = Value::load(to + states * count);
+                const Value g1 = Value::load(to + (states + 1) * count);
+                trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA { a[state].store(to + state * count); });
+                a = trellis::forwardStep(Decision{}, a, trellis::BranchMetrics<Value>{g0, g1, g1, g0});
+            }
+        }
+        asm volatile("" ::"r"(slots) : "memory");
+    }
+
+    static constexpr bench::Probe probe = {count, run};
+};
+
+constexpr bench::Probe probes[] = {
+    Loop<8>::probe,
+#if defined(__AVX2__)
+    Loop<16>::probe,
+#endif
+#if defined(__AVX512BW__)
+    Loop<32>::probe,
+#endif
+};
+
+}  // namespace
+
+extern const bench::ProbeSet probeSet;
+const bench::ProbeSet probeSet = {MORVIK_LANES_NAME, probes, static_cast<unsigned>(sizeof probes / sizeof probes[0])};
+
+}  // namespace MORVIK_LANES

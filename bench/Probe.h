@@ -1,0 +1,26 @@
+// Probe: the plain forward recursion, as fast as an instruction set runs it.
+#ifndef MORVIK_BENCH_PROBE_H
+#define MORVIK_BENCH_PROBE_H
+
+namespace bench {
+
+/// The loop at one width, a vector of so many lanes.
+struct Probe {
+    unsigned lanes;
+    /// Runs `rounds` times over `steps` steps.
+    void (*run)(unsigned rounds);
+
+    /// So few that branch metrics and forward metrics of the widest vectors stay in the first cache.
+    static constexpr unsigned steps = 32;
+};
+
+/// The probes of an instruction set.
+struct ProbeSet {
+    const char* name;
+    const Probe* probes;
+    unsigned count;
+};
+
+}  // namespace bench
+
+#endif

@@ -1,0 +1,35 @@
+// Report: the tables, as Markdown that reads well in a terminal.
+#ifndef MORVIK_BENCH_REPORT_H
+#define MORVIK_BENCH_REPORT_H
+
+#include <ostream>
+
+#include "Limits.h"
+#include "Measure.h"
+
+namespace bench {
+
+/// Prints lines as they come; each table begins with its first line.
+class Report {
+public:
+    Report(std::ostream& os, const Limits& limits);
+
+    void add(const Work& work, const Figures& figures);
+
+    /// What stands below the tables.
+    void finish();
+
+private:
+    void addLine(const Work& work, const Figures& figures);
+    void addCompared(const Work& work, const Figures& figures);
+    void printLimits();
+
+    std::ostream& itsStream;
+    const Limits& itsLimits;
+    bool itsLinesBegun = false;
+    bool itsComparisonBegun = false;
+};
+
+}  // namespace bench
+
+#endif

@@ -1,0 +1,85 @@
+// morvik_bench_plain: measures and prints the tables, on nothing but the library.
+#include <exception>
+#include <iostream>
+#include <regex>
+
+#include "Options.h"
+#include "Report.h"
+
+namespace {
+
+using bench::Figures;
+using bench::Work;
+
+std::vector<Work> chosenWork(const std::string& filter)
+{
+    const std::regex wanted(filter, std::regex::extended);
+    std::vector<Work> chosen;
+    for (const Work& work : bench::allWork()) {
+        if (std::regex_search(work.name(), wanted)) {
+            chosen.push_back(work);
+        }
+    }
+    if (chosen.empty()) {
+        throw std::invalid_argument("no line's name matches '" + filter + "'");
+    }
+    return chosen;
+}
+
+bench::Sample sample(bench::Decoding& decoding, unsigned runs)
+{
+    const bench::Stopwatch stopwatch;
+    for (unsigned i = 0; i < runs; ++i) {
+        decoding.run();
+    }
+    return stopwatch.stop(runs);
+}
+
+Figures measure(const Work& work, const bench::Options& options, double limit)
+{
+    const auto decoding = bench::makeDecoding(work);
+    decoding->run();
+    bench::checkDecisions(work, decoding->bitErrorRate());
+    const double once = sample(*decoding, 1).seconds;
+    const auto runs = static_cast<unsigned>(options.seconds / once) + 1;
+    std::vector<Figures> all;
+    for (unsigned i = 0; i < options.repetitions; ++i) {
+        all.push_back(bench::figures(work, *decoding, sample(*decoding, runs), limit));
+    }
+    return bench::medians(all);
+}
+
+void measureAll(const bench::Options& options)
+{
+    const std::vector<Work> chosen = chosenWork(options.filter);
+    const bench::Limits limits;
+    bench::Report report(std::cout, limits);
+    for (const Work& work : chosen) {
+        report.add(work, measure(work, options, limits.cyclesPerStep(work)));
+    }
+    report.finish();
+}
+
+void list(const bench::Options& options)
+{
+    for (const Work& work : chosenWork(options.filter)) {
+        std::cout << work.name() << '\n';
+    }
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    CLI::App app("Measures how fast morvik decodes.", "morvik_bench_plain");
+    bench::Options options;
+    bench::addOptions(app, options);
+    CLI11_PARSE(app, argc, argv);
+    try {
+        (options.list ? list : measureAll)(options);
+    } catch (const std::exception& error) {
+        std::cerr << "morvik_bench_plain: " << error.what() << '\n';
+        return 1;
+    }
+    return 0;
+}

@@ -1,0 +1,29 @@
+#!/usr/bin/env bash
+# Runs the short lines of the benchmark for a moment: it must succeed, which includes that the decoders
+# decided rightly, and print whole tables.
+#   smoke_test.sh MORVIK_BENCH_PLAIN
+set -euo pipefail
+output=$("$1" --filter 'K=40/|compare/K=512/' --repetitions 2 --seconds 0.001)
+fail() {
+    echo "smoke_test.sh: $1 in:" >&2
+    echo "$output" >&2
+    exit 1
+}
+# expect COUNT WHAT REGEX: so many lines look like this.
+expect() {
+    [ "$(grep -cE "$3" <<<"$output")" = "$1" ] || fail "not $1 $2"
+}
+number='[0-9]+(\.[0-9]+)?(e-[0-9]+)?'
+positive=' +[0-9]*[1-9][0-9]*\.[0-9]+| +[0-9]+\.[0-9]*[1-9][0-9]*'
+expect 1 'table of lines' '^\| +K \| units \| type \| call +\| instruction set \| +Mbit/s \|.*\| ratio to probe \|$'
+expect 2 'lines of 40 bits' "^\\| +40 \\| +4 \\| +1 \\| [a-z0-9 ]+ \\| [a-z0-9]+ +(\\|($positive) ){4}\\|\$"
+expect 1 'table of decoders' '^\| decoder +\| +K \|.*\| bit error rate \|$'
+expect 2 'lines of morvik among the decoders' \
+    "^\\| morvik, 4 units, type 0 \\| +512 \\| [a-z0-9 ]+ (\\|($positive) ){3}\\| +$number \\|\$"
+expect 1 'line on IT++' "^\\| IT\\+\\+ LOGMAX +\\| +512 \\| single +(\\|($positive) ){3}\\| +$number \\|\$|^IT\\+\\+ was left out"
+expect 1 'table of the probe' '^\| instruction set \| lanes \| cycles/step/16 lanes \|$'
+expect 1 'probe of what every machine has' "^\\| generic +\\| +8 \\|($positive) \\|\$"
+
+if "$1" --filter 'no such line' >/dev/null 2>&1; then
+    fail 'a filter that matches nothing is accepted'
+fi
