@@ -12,6 +12,7 @@
 #include <utility>
 #include <vector>
 
+#include "DecoderState.h"
 #include "support/Batches.h"
 #include "support/Blocks.h"
 #include "support/CapturedStreams.h"
@@ -160,6 +161,8 @@ TYPED_TEST(BatchOf, BlocksGivesWhatSingleCallsGive)
             EXPECT_EQ(room.ratios,
                       guarded(decodedOneByOne(components.state(), batch, 3, tags.data()).ratios, untouchedRatio));
         }
+        EXPECT_EQ(batched.state()->decoder->itsDecodeCount, 60U);
+        EXPECT_EQ(batched.state()->decoder->itsHalfIterationCount, 6 * 60U);
         const Block last = someBlocks(1, 256, 1)[0];
         const std::string trace = traceOf(single, last);
         EXPECT_NE(trace.find("decode=60 "), std::string::npos);
