@@ -5,16 +5,13 @@
 // -128 ... 127 and any state is reached from any other in three steps, over a branch pair that shares its
 // metric in the last one. From that follow, step by step (lane_bounds_test computes them):
 //
-//   between two states of a column             within 786, 793 in a kept border column,
-//                                              1292 in the three steps after a known start,
-//                                              1287 in the tail's column
-//   between two candidates of a recursion      within 1554
-//   between two branches of a ratio's tree     within 1606, but 2351 in the first three steps of a block
-//                                              and in its last one
-//   a ratio                                    within 1072
+//   between two states of a column             within 786; 1228 in the three steps after a known start,
+//                                              1287 in the tail's column, 670 in a kept border column
+//   between two candidates of a recursion      within 1484
+//   between two branches in a ratio's tree     within 1340, near the ends of a block 1898
+//   a ratio                                    within 944
 //
-// Corrections of MOD#, 6 steps at most for each decision, are counted in. So the recursions may decide by
-// a plain maximum everywhere, and ratios everywhere but in those four steps.
+// Corrections of MOD#, 6 steps at most for each decision, are counted in. So plain maxima decide everywhere.
 //
 // In 64 steps a metric grows by 64 (128 + 6) at most; a column that starts within 1300 of 0 stays within
 // 9900, and the sum of a forward and a backward one within 20000: no 16-bit word overflows in a window.
@@ -26,9 +23,6 @@
 namespace lanes {
 
 constexpr unsigned longestWindow = 64;
-
-constexpr unsigned wrappingFirstSteps = 3;
-constexpr unsigned wrappingLastSteps = 1;
 
 /// The branch format's limits.
 constexpr int branchMin = -128;

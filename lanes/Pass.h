@@ -119,7 +119,7 @@ private:
     MORVIK_INLINE void runForward(const Window& window) const
     {
         Column a = restoreForward(window.v);
-        forward(window, window.from, window.to, a);
+        forward(window, a);
         saveForward(window.v, broughtBack(a));
     }
 
@@ -128,25 +128,16 @@ private:
     template <bool last>
     MORVIK_INLINE void runWindows(const Window& window, const Window& next) const
     {
-        const unsigned from = window.from;
-        const unsigned to = window.to;
-        const unsigned wrappingFrom = to == w.steps ? to - lanes::wrappingLastSteps : to;
-        const unsigned wrappingTo = from == 0 ? lanes::wrappingFirstSteps : from;
         Column b = load(itsRows.betaStart + window.r * states * row + window.v * count);
-        backward<last, true>(window, wrappingFrom, to, b);
         if constexpr (overlapped) {
-            const unsigned inBoth = least(wrappingFrom - wrappingTo, next.length());
             Column a = next.length() != 0 ? restoreForward(next.v) : Column{};
-            both<last>(window, wrappingFrom, b, next, inBoth, a);
-            backward<last, false>(window, wrappingTo, wrappingFrom - inBoth, b);
-            backward<last, true>(window, from, wrappingTo, b);
-            forward(next, next.from + inBoth, next.to, a);
+            both<last>(window, b, next, a);
+            backward<last>(window, window.to - next.length(), b);
             if (next.length() != 0) {
                 saveForward(next.v, broughtBack(a));
             }
         } else {
-            backward<last, false>(window, wrappingTo, wrappingFrom, b);
-            backward<last, true>(window, from, wrappingTo, b);
+            backward<last>(window, window.to, b);
             if (next.length() != 0) {
                 runForward(next);
             }
@@ -160,39 +151,35 @@ private:
     static constexpr bool overlapped = false;
 #endif
 
-    static MORVIK_INLINE unsigned least(unsigned a, unsigned b)
+    MORVIK_INLINE void forward(const Window& window, Column& a) const
     {
-        return a < b ? a : b;
-    }
-
-    MORVIK_INLINE void forward(const Window& window, unsigned from, unsigned to, Column& a) const
-    {
-        std::int16_t* slot = itsSlots + window.slotOf(from);
-        for (unsigned k = from; k < to; ++k) {
+        std::int16_t* slot = itsSlots + window.slot;
+        for (unsigned k = window.from; k < window.to; ++k) {
             forwardStep(k, window.v, slot, a);
             slot += window.direction;
         }
     }
 
-    template <bool last, bool wrapping>
-    MORVIK_INLINE void backward(const Window& window, unsigned from, unsigned to, Column& b) const
+    /// The steps of the window before `to`.
+    template <bool last>
+    MORVIK_INLINE void backward(const Window& window, unsigned to, Column& b) const
     {
         const std::int16_t* slot = itsSlots + window.slotOf(to);
-        for (unsigned k = to; k-- > from;) {
+        for (unsigned k = to; k-- > window.from;) {
             slot -= window.direction;
-            backwardStep<last, wrapping>(k, window.v, slot, b);
+            backwardStep<last>(k, window.v, slot, b);
         }
     }
 
+    /// As many backward steps of the window as the next one, which is no longer, has forward steps.
     template <bool last>
-    MORVIK_INLINE void both(
-        const Window& window, unsigned to, Column& b, const Window& next, unsigned steps, Column& a) const
+    MORVIK_INLINE void both(const Window& window, Column& b, const Window& next, Column& a) const
     {
-        const std::int16_t* slot = itsSlots + window.slotOf(to);
+        const std::int16_t* slot = itsSlots + window.slotOf(window.to);
         std::int16_t* nextSlot = itsSlots + next.slot;
-        for (unsigned i = 0; i < steps; ++i) {
+        for (unsigned i = 0; i < next.length(); ++i) {
             slot -= window.direction;
-            backwardStep<last, false>(to - 1 - i, window.v, slot, b);
+            backwardStep<last>(window.to - 1 - i, window.v, slot, b);
             forwardStep(next.from + i, next.v, nextSlot, a);
             nextSlot += next.direction;
         }
@@ -216,7 +203,7 @@ private:
         a = trellis::forwardStep(itsRule.decision(), a, g);
     }
 
-    template <bool last, bool wrapping>
+    template <bool last>
     MORVIK_INLINE void backwardStep(unsigned k, unsigned v, const std::int16_t* slot, Column& b) const
     {
         const Value g0 = Value::load(slot + slotBranches);
@@ -229,7 +216,7 @@ private:
             beta[state] = Decision::stored(b[state]);
         });
         const auto c = trellis::candidates(itsRule.decision(), b, g);
-        const Value ratio = wrapping ? itsRule.wrapping(alpha, beta, g) : itsRule.ratio(alpha, beta, g, c);
+        const Value ratio = itsRule.ratio(alpha, beta, g, c);
         if constexpr (last) {
             ratio.store(itsRatios + at(k, v));
         }

@@ -15,25 +15,6 @@ using StepsColumn = std::array<Steps<count>, trellis::stateCount>;
 template <unsigned count>
 using StepsBranches = trellis::BranchMetrics<Steps<count>>;
 
-/// The ratio of a step, with comparisons that wrap where the hardware's do.
-template <unsigned count, class Decision>
-MORVIK_INLINE Steps<count> wrappingRatio(const Decision& rule,
-                                         const StepsColumn<count>& a,
-                                         const StepsColumn<count>& b,
-                                         const StepsBranches<count>& g)
-{
-    using Word = Aligned<count>;
-    std::array<Word, trellis::stateCount> alignedA{};
-    std::array<Word, trellis::stateCount> alignedB{};
-    trellis::BranchMetrics<Word> alignedG{};
-    trellis::forEach<trellis::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
-        alignedA[state] = Word(a[state]);
-        alignedB[state] = Word(b[state]);
-    });
-    trellis::forEach<4>([&](auto i) MORVIK_INLINE_LAMBDA { alignedG[i] = Word(g[i]); });
-    return trellis::logLikelihoodRatio(rule, alignedA, alignedB, alignedG).steps();
-}
-
 /// "MOD": max-log-MAP.
 template <unsigned countOfLanes>
 struct Greatest {
@@ -58,13 +39,6 @@ struct Greatest {
         return greatest(a, c.one) - greatest(a, c.zero);
     }
 
-    MORVIK_INLINE Steps<count> wrapping(const StepsColumn<count>& a,
-                                        const StepsColumn<count>& b,
-                                        const StepsBranches<count>& g) const
-    {
-        return wrappingRatio<count>(trellis::DecideMax<Aligned<count>>{}, a, b, g);
-    }
-
 private:
     static MORVIK_INLINE Steps<count> greatest(const StepsColumn<count>& a, const StepsColumn<count>& c)
     {
@@ -82,11 +56,6 @@ struct Corrections {
     {
         const Steps<count> magnitude = max(difference, Steps<count>::of(-1) - difference);  // -1 reads like 0
         return table.at(min(magnitude, Steps<count>::of(4 * 15)) >> 2);
-    }
-
-    MORVIK_INLINE Aligned<count> operator()(Aligned<count> difference) const
-    {
-        return Aligned<count>((*this)(difference.steps()));
     }
 };
 
@@ -111,14 +80,6 @@ struct Corrected {
                                      const trellis::Candidates<Decision>&) const
     {
         return trellis::logLikelihoodRatio(decision(), a, b, g);
-    }
-
-    MORVIK_INLINE Steps<count> wrapping(const StepsColumn<count>& a,
-                                        const StepsColumn<count>& b,
-                                        const StepsBranches<count>& g) const
-    {
-        using Wrapping = trellis::DecideMaxHash<Aligned<count>, Corrections<count>>;
-        return wrappingRatio<count>(Wrapping(corrections), a, b, g);
     }
 };
 

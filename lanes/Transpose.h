@@ -116,7 +116,8 @@ void storeRows(const std::int16_t* rows, unsigned lanes, unsigned steps, Output*
                     // A ratio of 0 or more decides for 1 (rule 16): its sign bit is clear.
                     values = __builtin_convertvector((tile[i] >> 15) + 1, Outputs);
                 } else {
-                    values = Aligned<Tile::size>(Steps<Tile::size>{tile[i]}).word();
+                    // A step is 16 in an aligned word, which wraps.
+                    values = reinterpret_cast<Outputs>(reinterpret_cast<Raw<Tile::size>::Unsigned>(tile[i]) << 4);
                 }
                 std::memcpy(arrays[lane + i] + k, &values, sizeof values);
             }

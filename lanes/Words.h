@@ -1,8 +1,7 @@
-// Words: vectors of 16-bit words, the value types over which the lanes run the trellis.
+// Words: vectors of 16-bit words, the value type over which the lanes run the trellis.
 //
-// Two readings of the same vector. `Steps` holds whole steps of the formats, which is an aligned word
-// divided by 16, and is never wrapped: four spare bits let a plain maximum decide (Bounds.h proves it).
-// `Aligned` holds left-aligned words that wrap as the hardware's registers do.
+// `Steps` holds whole steps of the formats, which is an aligned word divided by 16, and is never wrapped: four
+// spare bits let a plain maximum decide (Bounds.h proves it).
 //
 // This text is compiled once for each instruction set, in a namespace of its own, MORVIK_LANES, so that
 // nothing that is compiled for one can serve another.
@@ -128,51 +127,6 @@ struct Steps {
     friend MORVIK_INLINE Steps maxWrap(Steps c1, Steps c2)
     {
         return max(c1, c2);
-    }
-};
-
-/// Left-aligned words, in each of `count` lanes, that wrap modulo 2^16.
-template <unsigned count>
-struct Aligned {
-    using Signed = typename Raw<count>::Signed;
-    using Unsigned = typename Raw<count>::Unsigned;
-
-    Unsigned v = {};
-
-    Aligned() = default;
-    explicit MORVIK_INLINE Aligned(Unsigned words) : v(words) {}
-    explicit MORVIK_INLINE Aligned(Steps<count> steps) : v(reinterpret_cast<Unsigned>(steps.v) << 4) {}
-
-    MORVIK_INLINE Signed word() const
-    {
-        return reinterpret_cast<Signed>(v);
-    }
-
-    /// The steps of the wrapped word: -2048 to 2047.
-    MORVIK_INLINE Steps<count> steps() const
-    {
-        return {word() >> 4};
-    }
-
-    friend MORVIK_INLINE Aligned addWrap(Aligned a, Aligned b)
-    {
-        return Aligned(a.v + b.v);
-    }
-
-    friend MORVIK_INLINE Aligned subWrap(Aligned a, Aligned b)
-    {
-        return Aligned(a.v - b.v);
-    }
-
-    friend MORVIK_INLINE Aligned select(Aligned difference, Aligned c1, Aligned c2)
-    {
-        return Aligned(reinterpret_cast<Signed>(difference.v) < 0 ? c2.v : c1.v);
-    }
-
-    friend MORVIK_INLINE Aligned maxWrap(Aligned c1, Aligned c2)
-    {
-        const Signed difference = subWrap(c1, c2).word();
-        return addWrap(c2, Aligned(reinterpret_cast<Unsigned>(difference > 0 ? difference : Signed{})));
     }
 };
 
