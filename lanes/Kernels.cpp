@@ -14,7 +14,7 @@ struct Shape {
 
     static void prepare(const std::uint8_t* source, std::uint8_t* control)
     {
-        for (unsigned v = 0; v < vectors; ++v) {
+        for (std::size_t v = 0; v < vectors; ++v) {
             LanesOfRow::prepare(source + v * count, control + v * LanesOfRow::bytes);
         }
     }
@@ -48,10 +48,10 @@ struct Shape {
     static void interleave(const lanes::Workspace& workspace)
     {
         const lanes::ConstituentRows& rows = workspace.constituent[1];
-        for (unsigned k = 0; k < workspace.steps; ++k) {
-            const std::int16_t* source = workspace.constituent[0].systematic + rows.sourceRow[k] * lanes;
-            for (unsigned v = 0; v < vectors; ++v) {
-                const unsigned at = k * vectors + v;
+        for (std::size_t k = 0; k < workspace.steps; ++k) {
+            const std::int16_t* source = workspace.constituent[0].systematic + std::size_t{rows.sourceRow[k]} * lanes;
+            for (std::size_t v = 0; v < vectors; ++v) {
+                const std::size_t at = k * vectors + v;
                 LanesOfRow::load(source, rows.permutations + at * LanesOfRow::bytes)
                     .store(rows.systematic + at * count);
             }
@@ -75,7 +75,7 @@ struct Shape {
     }
 
     static constexpr unsigned slotBytes = 2 * count * (trellis::stateCount + 3);
-    static constexpr unsigned forwardBytes = 2 * vectors * sizeof(Steps<count>) * trellis::stateCount;
+    static constexpr unsigned forwardBytes = 2 * 2 * lanes * trellis::stateCount;  // values, and what is pending
 
     static constexpr lanes::Kernel kernel = {lanes,
                                              count,

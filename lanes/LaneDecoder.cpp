@@ -234,7 +234,7 @@ void LaneDecoder::decode(unsigned halfIterations)
 void LaneDecoder::prepareStarts(unsigned d)
 {
     const Workspace& space = itsCurrent->space;
-    const unsigned row = itsKernel->lanes;
+    const std::size_t row = itsKernel->lanes;
     std::int16_t* const alpha = space.constituent[d].alphaStart;
     std::int16_t* const beta = space.constituent[d].betaStart;
     std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * row;
@@ -243,7 +243,7 @@ void LaneDecoder::prepareStarts(unsigned d)
     const std::size_t reached = states * (row + std::size_t{2} * itsKernel->vectorLanes);
     std::fill_n(space.constituent[d].alphaReached, reached, std::int16_t{0});
     std::fill_n(space.constituent[d].betaReached, reached, std::int16_t{0});
-    for (unsigned first = 0; first < row; first += space.segments) {
+    for (unsigned first = 0; first < itsKernel->lanes; first += space.segments) {
         const std::array<int, 12>& t = itsTails[blockOf(first)];
         const unsigned o = 6 * d;
         const auto metrics =

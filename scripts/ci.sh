@@ -19,7 +19,7 @@ stage_lint() {
     # On the standard error stream it counts what it suppresses, and says why it could not run.
     local log=build/x86_64/lint.log
     # Two units of bench/ need packages that are not set up here.
-    git ls-files 'src/*.cpp' 'app/*.cpp' 'tests/*.cpp' 'bench/*.cpp' |
+    git ls-files 'src/*.cpp' 'lanes/*.cpp' 'app/*.cpp' 'tests/*.cpp' 'bench/*.cpp' |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/x86_64 --quiet 2>"$log" || { cat "$log" >&2; return 1; }
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \

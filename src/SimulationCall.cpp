@@ -11,7 +11,8 @@ namespace simulation_call {
 
 namespace {
 
-constexpr const char* streamNames[3] = {"RSC1 systematic", "RSC1 parity", "RSC2 parity"};
+constexpr unsigned streamCount = 3;
+constexpr const char* streamNames[streamCount] = {"RSC1 systematic", "RSC1 parity", "RSC2 parity"};
 
 /// Positions of a block that carry its tail.
 constexpr std::int32_t tailPositions = 4;
@@ -42,7 +43,7 @@ void reportSaturation(State& state, unsigned stream, std::int32_t position, bool
 }
 
 template <class Input>
-std::array<const Input*, 3> inOrder(const lanes::Streams<Input>& streams)
+std::array<const Input*, streamCount> inOrder(const lanes::Streams<Input>& streams)
 {
     return {streams.systematic, streams.parity1, streams.parity2};
 }
@@ -54,7 +55,7 @@ void convert(State& state, const lanes::Streams<Input>& block, std::int32_t dinS
 {
     const auto streams = inOrder(block);
     for (std::int32_t i = 0; i < dinSize; ++i) {
-        for (unsigned s = 0; s < streams.size(); ++s) {
+        for (unsigned s = 0; s < streamCount; ++s) {
             std::int32_t excess = 0;
             const std::int32_t kept = inputInteger(streams[s][i], *state.input_format, excess);
             if (excess != 0) {
