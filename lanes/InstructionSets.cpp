@@ -1,11 +1,16 @@
 // InstructionSets: the compilations of the lanes, and which of them this machine can run.
 #include "InstructionSets.h"
 
+// MORVIK_LANES_ONLY_GENERIC leaves the others out, for builds that compare compilers.
+#if (defined(__x86_64__) || defined(__i386__)) && !defined(MORVIK_LANES_ONLY_GENERIC)
+#define MORVIK_LANES_X86
+#endif
+
 // One compilation of Kernels.cpp defines each.
 namespace lanes_generic {
 extern const lanes::InstructionSet instructionSet;
 }
-#if defined(__x86_64__) || defined(__i386__)
+#if defined(MORVIK_LANES_X86)
 namespace lanes_ssse3 {
 extern const lanes::InstructionSet instructionSet;
 }
@@ -22,7 +27,7 @@ namespace lanes {
 std::vector<const InstructionSet*> availableInstructionSets()
 {
     std::vector<const InstructionSet*> sets;
-#if defined(__x86_64__) || defined(__i386__)
+#if defined(MORVIK_LANES_X86)
     __builtin_cpu_init();
     if (__builtin_cpu_supports("avx512bw") && __builtin_cpu_supports("avx512vl")) {
         sets.push_back(&lanes_avx512::instructionSet);

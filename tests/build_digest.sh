@@ -9,13 +9,7 @@ root=$(dirname "$tests")
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-kernels() {
-    "${compile[@]}" "${@:2}" -DMORVIK_LANES="lanes_$1" -DMORVIK_LANES_NAME="\"$1\"" \
-        -c "$root/lanes/Kernels.cpp" -o "$work/$1.o"
-}
-kernels generic
-kernels ssse3 -mssse3
-kernels avx2 -mavx2
-kernels avx512 -mavx512f -mavx512bw -mavx512vl
-"${compile[@]}" -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp "$root/lanes/InstructionSets.cpp" \
-    "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/digest.cpp" "$work"/*.o -o "$program"
+"${compile[@]}" -DMORVIK_LANES=lanes_generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
+"${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp \
+    "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/digest.cpp" \
+    "$work/kernels.o" -o "$program"

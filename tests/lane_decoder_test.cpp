@@ -339,6 +339,13 @@ TEST_P(LaneDecoderTest, TiesAreDecodedAlike)
     }
 }
 
+/// The components are slow in builds without optimisation and with sanitizers: there, a sample has to do.
+#if defined(__OPTIMIZE__) && !defined(__SANITIZE_ADDRESS__)
+constexpr unsigned combinationsPerOneTaken = 1;
+#else
+constexpr unsigned combinationsPerOneTaken = 17;
+#endif
+
 /// Each block size with each number of units and each algorithm type, each of them with another number of
 /// blocks and passes. MORVIK_TEST_BLOCKS, other than 0, asks for all numbers of blocks with all of them.
 TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
@@ -352,6 +359,10 @@ TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
             const unsigned capacity =
                 std::max(1U, lanesOfRow() / segmentation::segmentCount(K, std::uint64_t{4} * units));
             for (const Algorithm algorithm : algorithms) {
+                if (!all && turn % combinationsPerOneTaken != 0) {
+                    ++turn;
+                    continue;
+                }
                 const std::vector<unsigned> sizes = batchSizes(capacity);
                 for (std::size_t i = 0; i < sizes.size(); ++i) {
                     if (!all && i != turn % sizes.size()) {
