@@ -129,6 +129,9 @@ void LanePath::keepLast()
 void LanePath::catchUp()
 {
     keepLast();
+    if (itsPast.empty()) {
+        return;
+    }
     const UncountedDecodes uncounted(itsDecoder);
     const unsigned shift = itsDecoder.itsEngine->itsStateFormat->itsShift;
     for (const Past& past : itsPast) {

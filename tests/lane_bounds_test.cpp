@@ -6,6 +6,8 @@
 // metrics are.
 #include <gtest/gtest.h>
 
+#include <cstddef>
+
 #include <algorithm>
 #include <array>
 #include <cstdint>
@@ -167,7 +169,7 @@ std::vector<Leads> columnsFrom(Direction direction, const Leads& start)
 
 Leads anyOf(const std::vector<Leads>& columns, unsigned first)
 {
-    return std::accumulate(columns.begin() + first, columns.end(), columns.back(), either);
+    return std::accumulate(columns.begin() + static_cast<std::ptrdiff_t>(first), columns.end(), columns.back(), either);
 }
 
 Leads knownColumn()
