@@ -49,18 +49,12 @@ const lanes::InstructionSet* instructionSet(const std::string& name)
     return nullptr;
 }
 
-/// Lanes of the vectors that the work is done on: those of the narrowest kernel that has room for all
-/// segments, or of the widest one.
+/// Lanes of the vectors that the work is done on.
 unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
 {
     constexpr std::uint64_t threads = 4;  // of each processing unit
     const unsigned segments = segmentation::segmentCount(work.blockSize, threads * static_cast<unsigned>(work.units));
-    const unsigned wanted = segments * (work.call == Work::Call::batch ? work.blocks : 1);
-    unsigned i = 0;
-    while (i + 1 < set.kernelCount && set.kernels[i].lanes < wanted) {
-        ++i;
-    }
-    return set.kernels[i].vectorLanes;
+    return lanes::kernelFor(set, segments, work.call == Work::Call::batch ? work.blocks : 1).vectorLanes;
 }
 
 }  // namespace

@@ -48,4 +48,14 @@ const InstructionSet& bestInstructionSet()
     return *availableInstructionSets().front();
 }
 
+const Kernel& kernelFor(const InstructionSet& instructionSet, unsigned segments, unsigned blocks)
+{
+    const Kernel* kernel = instructionSet.kernels;
+    const Kernel* const widest = kernel + instructionSet.kernelCount - 1;
+    while (kernel != widest && kernel->lanes / segments < blocks) {
+        ++kernel;
+    }
+    return *kernel;
+}
+
 }  // namespace lanes

@@ -14,6 +14,9 @@ std::vector<const InstructionSet*> availableInstructionSets();
 /// The best one.
 const InstructionSet& bestInstructionSet();
 
+/// The narrowest kernel that has room for all of `blocks` blocks of so many segments, or the widest one.
+const Kernel& kernelFor(const InstructionSet& instructionSet, unsigned segments, unsigned blocks);
+
 }  // namespace lanes
 
 #endif

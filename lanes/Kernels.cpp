@@ -74,8 +74,9 @@ struct Shape {
         }
     }
 
-    static constexpr unsigned slotBytes = 2 * count * (trellis::stateCount + 3);
-    static constexpr unsigned forwardBytes = 2 * 2 * lanes * trellis::stateCount;  // values, and what is pending
+    static constexpr unsigned slotBytes = Pass<Greatest<count>, vectors, false>::slotBytes;
+    /// Of the rule that keeps more: what is pending with its values.
+    static constexpr unsigned forwardBytes = Pass<Corrected<count>, vectors, false>::forwardBytes;
 
     static constexpr lanes::Kernel kernel = {lanes,
                                              count,

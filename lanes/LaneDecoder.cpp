@@ -6,6 +6,7 @@
 
 #include "../src/Trellis.h"
 #include "Bounds.h"
+#include "InstructionSets.h"
 
 namespace lanes {
 
@@ -40,6 +41,12 @@ private:
     unsigned char* const itsBase;
     std::size_t itsSize = 0;
 };
+
+/// Words of the columns that a pass reached: rows with a vector more at both ends.
+std::size_t reachedWords(const Kernel& kernel)
+{
+    return states * (kernel.lanes + std::size_t{2} * kernel.vectorLanes);
+}
 
 bool loadRows(const Kernel& kernel, const std::int32_t* const* arrays, unsigned steps, std::int16_t* rows)
 {
@@ -82,20 +89,9 @@ unsigned LaneDecoder::steps() const
     return itsCut.blockSize / itsCut.segments;
 }
 
-/// The narrowest kernel that has room for all of them, or the widest.
-const Kernel& LaneDecoder::kernelFor(unsigned blocks) const
-{
-    const Kernel* kernel = itsInstructionSet.kernels;
-    const Kernel* const widest = kernel + itsInstructionSet.kernelCount - 1;
-    while (kernel != widest && kernel->lanes / itsCut.segments < blocks) {
-        ++kernel;
-    }
-    return *kernel;
-}
-
 unsigned LaneDecoder::blocksTaken(unsigned blocks) const
 {
-    return std::min(blocks, kernelFor(blocks).lanes / itsCut.segments);
+    return std::min(blocks, kernelFor(itsInstructionSet, itsCut.segments, blocks).lanes / itsCut.segments);
 }
 
 void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
@@ -118,12 +114,10 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
 std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char* base) const
 {
     const std::size_t row = kernel.lanes;
-    const std::size_t wideRow = row + std::size_t{2} * kernel.vectorLanes;
     const std::size_t rows = steps() * row;
     const std::size_t windows = itsCut.windowStart.size() - 1;
     Layout layout(base);
     Workspace& space = work.space;
-    space.segments = itsCut.segments;
     space.steps = steps();
     space.windows = static_cast<unsigned>(windows);
     space.corrections = itsCorrections.data();
@@ -137,8 +131,8 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
                                 work.permutations[d],
                                 layout.take<std::int16_t>(states * row),
                                 layout.take<std::int16_t>(windows * states * row),
-                                layout.take<std::int16_t>(states * wideRow),
-                                layout.take<std::int16_t>(states * wideRow)};
+                                layout.take<std::int16_t>(reachedWords(kernel)),
+                                layout.take<std::int16_t>(reachedWords(kernel))};
     }
     space.firstLanes = work.firstLanes = layout.take<std::int16_t>(row);
     space.lastLanes = work.lastLanes = layout.take<std::int16_t>(row);
@@ -174,7 +168,7 @@ void LaneDecoder::preparePermutation(const Kernel& kernel,
 template <class Input>
 bool LaneDecoder::load(const Streams<Input>* blocks, unsigned count)
 {
-    const Kernel& kernel = kernelFor(count);
+    const Kernel& kernel = kernelFor(itsInstructionSet, itsCut.segments, count);
     Work& work = itsWork[static_cast<std::size_t>(&kernel - itsInstructionSet.kernels)];
     if (work.blockSize != itsCut.blockSize) {
         prepareWork(kernel, work);
@@ -240,17 +234,17 @@ void LaneDecoder::prepareStarts(unsigned d)
     std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * row;
     std::fill_n(alpha, states * row, std::int16_t{0});
     std::fill(beta, lastBeta + states * row, std::int16_t{0});
-    const std::size_t reached = states * (row + std::size_t{2} * itsKernel->vectorLanes);
-    std::fill_n(space.constituent[d].alphaReached, reached, std::int16_t{0});
-    std::fill_n(space.constituent[d].betaReached, reached, std::int16_t{0});
-    for (unsigned first = 0; first < itsKernel->lanes; first += space.segments) {
+    std::fill_n(space.constituent[d].alphaReached, reachedWords(*itsKernel), std::int16_t{0});
+    std::fill_n(space.constituent[d].betaReached, reachedWords(*itsKernel), std::int16_t{0});
+    for (unsigned first = 0; first < itsKernel->lanes; first += itsCut.segments) {
         const std::array<int, 12>& t = itsTails[blockOf(first)];
         const unsigned o = 6 * d;
         const auto metrics =
             trellis::tailColumn<int>({{t[o], t[o + 2], t[o + 4]}, {t[o + 1], t[o + 3], t[o + 5]}, {0, 0, 0}});
         for (unsigned state = 0; state < states; ++state) {
             alpha[state * row + first] = state == 0 ? 0 : unlikely;
-            lastBeta[state * row + first + space.segments - 1] = static_cast<std::int16_t>(metrics[state] & borderMask);
+            lastBeta[state * row + first + itsCut.segments - 1] =
+                static_cast<std::int16_t>(metrics[state] & borderMask);
         }
     }
 }

@@ -20,6 +20,9 @@ struct BlockCut {
     std::vector<unsigned> permutation;  ///< K: position i of the interleaved order is position [i] of the natural one
 };
 
+/// Positions of a block that carry its tail, behind K others.
+constexpr unsigned tailPositions = 4;
+
 /// The caller's three streams of a block, K + 4 values each.
 template <class Input>
 struct Streams {
@@ -74,7 +77,6 @@ public:
     LoadedBlock loadedBlock(unsigned block) const;
 
 private:
-    static constexpr unsigned tailPositions = 4;
     static constexpr unsigned mostSteps = 768;
 
     /// The working memory of one kernel, for one block size.
@@ -90,7 +92,6 @@ private:
 
     unsigned steps() const;
     unsigned blockOf(unsigned lane) const;
-    const Kernel& kernelFor(unsigned blocks) const;
     void prepareWork(const Kernel& kernel, Work& work) const;
     std::size_t layOut(const Kernel& kernel, Work& work, unsigned char* base) const;
     void preparePermutation(const Kernel& kernel, Work& work, unsigned d, const std::vector<unsigned>& from) const;

@@ -29,7 +29,17 @@ class Pass {
     using Decision = typename Rule::Decision;
     using Column = trellis::Column<Decision>;
 
+    /// The metrics of a slot: eight forward metrics, two branch metrics (the others are their doubles: LTE
+    /// has no second parity stream, rule 5) and the joint value.
+    static constexpr unsigned slotBranches = states * count;
+    static constexpr unsigned slotJoint = slotBranches + 2 * count;
+    static constexpr unsigned slotWords = slotJoint + count;
+
 public:
+    /// What the workspace must have room for: a step of a window, and the forward recursion between two.
+    static constexpr unsigned slotBytes = 2 * slotWords;
+    static constexpr unsigned forwardBytes = vectors * static_cast<unsigned>(sizeof(Column));
+
     MORVIK_INLINE Pass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint)
         : w(workspace),
           itsRows(workspace.constituent[d]),
@@ -97,12 +107,6 @@ private:
             return slot + direction * (static_cast<std::ptrdiff_t>(step) - static_cast<std::ptrdiff_t>(from));
         }
     };
-
-    /// The metrics of a slot: eight forward metrics, two branch metrics (the others are their doubles: LTE
-    /// has no second parity stream, rule 5) and the joint value.
-    static constexpr unsigned slotBranches = states * count;
-    static constexpr unsigned slotJoint = slotBranches + 2 * count;
-    static constexpr unsigned slotWords = slotJoint + count;
 
     /// The window after `window` in the order of work.
     MORVIK_INLINE Window following(const Window& window) const

@@ -77,11 +77,6 @@ struct Steps {
         return {a.v | b.v};
     }
 
-    friend MORVIK_INLINE Steps operator^(Steps a, Steps b)
-    {
-        return {a.v ^ b.v};
-    }
-
     /// Divided by 2^bits, rounded down.
     friend MORVIK_INLINE Steps operator>>(Steps a, int bits)
     {

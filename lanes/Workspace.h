@@ -31,7 +31,6 @@ struct ConstituentRows {
 constexpr unsigned fetchAhead = 8;
 
 struct Workspace {
-    unsigned segments;            ///< of a block
     unsigned steps;               ///< of a segment
     unsigned windows;             ///< of a segment
     const unsigned* windowStart;  ///< [window + 1] the first step of each window, then `steps`

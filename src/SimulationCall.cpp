@@ -14,9 +14,6 @@ namespace {
 constexpr unsigned streamCount = 3;
 constexpr const char* streamNames[streamCount] = {"RSC1 systematic", "RSC1 parity", "RSC2 parity"};
 
-/// Positions of a block that carry its tail.
-constexpr std::int32_t tailPositions = 4;
-
 /// A caller's value as the input format holds it: the integer of its low bits, 24 for the hardware's
 /// format, clipped (rule 4). `excess` is what was clipped.
 std::int32_t inputInteger(std::int32_t value, const TNumberFormat& input, std::int32_t& excess)
@@ -112,7 +109,7 @@ Status decodeByComponents(State& state,
 bool lanesTake(const State& state, std::int32_t dinSize)
 {
     return state.lane_path != nullptr && !state.by_components && state.decoder->itsDumpCount == 0 &&
-           dinSize > tailPositions && state.interleaver->valid(static_cast<unsigned>(dinSize - tailPositions));
+           dinSize > std::int32_t{lanes::tailPositions} && state.interleaver->valid(blockSizeOf(dinSize));
 }
 
 template <class Input>
@@ -120,7 +117,7 @@ unsigned loadLanes(
     State& state, const lanes::Streams<Input>* blocks, unsigned count, std::int32_t dinSize, const std::uint32_t* tags)
 {
     LanePath& path = *state.lane_path;
-    path.prepare(static_cast<unsigned>(dinSize - tailPositions));
+    path.prepare(blockSizeOf(dinSize));
     const unsigned taken = path.blocksTaken(count);
     if (path.load(blocks, count)) {
         return taken;

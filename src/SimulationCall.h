@@ -67,6 +67,12 @@ Status decodeByComponents(State& state,
                           std::uint32_t iterations,
                           std::vector<unsigned char>& hard);
 
+/// K of a block of dinSize positions, which are as many as the tail has at least.
+inline unsigned blockSizeOf(std::int32_t dinSize)
+{
+    return static_cast<unsigned>(dinSize) - lanes::tailPositions;
+}
+
 /// Whether the lanes decode a block of dinSize positions for this state: nobody watches its columns.
 bool lanesTake(const State& state, std::int32_t dinSize);
 

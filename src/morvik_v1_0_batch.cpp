@@ -89,7 +89,7 @@ Status runByComponents(State& state, const Batch<Input>& batch, Outputs& outputs
 template <class Input>
 Status runByLanes(State& state, const Batch<Input>& batch, Outputs& outputs)
 {
-    const auto K = static_cast<std::size_t>(batch.dinSize - 4);
+    const std::size_t K = blockSizeOf(batch.dinSize);
     LanePath& path = *state.lane_path;
     if (const char* reason = shortArray(outputs, batch.blocks, K)) {
         // As in the single call, room is what is looked at last: the first block is decoded and counts.

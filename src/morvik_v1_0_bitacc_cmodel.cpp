@@ -198,7 +198,7 @@ int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state
     std::vector<unsigned char> hard;
     std::size_t K = 0;
     if (byLanes) {
-        K = static_cast<std::size_t>(din_size) - 4;
+        K = blockSizeOf(din_size);
         loadLanes<std::int32_t>(*state, &streams, 1, din_size, nullptr);
         state->lane_path->decode(iterations);
     } else {
