@@ -48,13 +48,11 @@ struct Shape {
     static void interleave(const lanes::Workspace& workspace)
     {
         const lanes::ConstituentRows& rows = workspace.constituent[1];
-        for (std::size_t k = 0; k < workspace.steps; ++k) {
-            const std::int16_t* source = workspace.constituent[0].systematic + std::size_t{rows.sourceRow[k]} * lanes;
-            for (std::size_t v = 0; v < vectors; ++v) {
-                const std::size_t at = k * vectors + v;
-                LanesOfRow::load(source, rows.permutations + at * LanesOfRow::bytes)
-                    .store(rows.systematic + at * count);
-            }
+        for (std::size_t at = 0; at < std::size_t{workspace.steps} * vectors; ++at) {
+            LanesOfRow::load(workspace.constituent[0].systematic,
+                             rows.interleaver.sources + at * LanesOfRow::sources,
+                             rows.interleaver.controls + at * LanesOfRow::bytes)
+                .store(rows.systematic + at * count);
         }
     }
 
@@ -80,6 +78,8 @@ struct Shape {
 
     static constexpr lanes::Kernel kernel = {lanes,
                                              count,
+                                             LanesOfRow::group,
+                                             vectors* LanesOfRow::sources,
                                              vectors* LanesOfRow::bytes,
                                              slotBytes,
                                              forwardBytes,

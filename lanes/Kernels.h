@@ -15,11 +15,13 @@ enum class Algorithm { greatest, greatestScaled, corrected };
 struct Kernel {
     unsigned lanes;             ///< of a row
     unsigned vectorLanes;       ///< of a vector
+    unsigned groupLanes;        ///< of a group, whose lanes come from one group of a source row (Permute.h)
+    unsigned sources;           ///< groups that a row's permutation names
     unsigned permutationBytes;  ///< that prepare writes for a row
     unsigned slotBytes;         ///< of one step of a window
     unsigned forwardBytes;      ///< of the forward recursion's state
 
-    /// Makes the control by which lane l of a row is taken from the lane source[l] of its source row.
+    /// Makes the control by which lane l of a row is taken from the lane source[l] of its source group.
     void (*prepare)(const std::uint8_t* source, std::uint8_t* control);
 
     /// Fills rows from one array for each lane, which holds `steps` values; false when a value was beyond

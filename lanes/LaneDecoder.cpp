@@ -7,6 +7,7 @@
 #include "../src/Trellis.h"
 #include "Bounds.h"
 #include "InstructionSets.h"
+#include "LaneOrder.h"
 
 namespace lanes {
 
@@ -42,10 +43,10 @@ private:
     std::size_t itsSize = 0;
 };
 
-/// Words of the columns that a pass reached: rows with a vector more at both ends.
-std::size_t reachedWords(const Kernel& kernel)
+RowPermutations takePermutations(const Kernel& kernel, Layout& layout, std::size_t rows)
 {
-    return states * (kernel.lanes + std::size_t{2} * kernel.vectorLanes);
+    return {layout.take<std::uint32_t>(rows * kernel.sources),
+            layout.take<std::uint8_t>(rows * kernel.permutationBytes)};
 }
 
 bool loadRows(const Kernel& kernel, const std::int32_t* const* arrays, unsigned steps, std::int16_t* rows)
@@ -101,13 +102,15 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
     void* base = work.storage.data();
     std::size_t space = work.storage.size();
     layOut(kernel, work, static_cast<unsigned char*>(std::align(Layout::line, 1, base, space)));
+    const LaneOrder order(itsCut.segments, kernel.groupLanes);
     for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
-        const unsigned segment = lane % itsCut.segments;
-        work.firstLanes[lane] = segment == 0 ? -1 : 0;
-        work.lastLanes[lane] = segment == itsCut.segments - 1 ? -1 : 0;
+        work.firstLanes[lane] = order.segment(lane) == 0 ? -1 : 0;
+        work.lastLanes[lane] = order.segment(lane) == itsCut.segments - 1 ? -1 : 0;
     }
-    preparePermutation(kernel, work, 0, itsInverse);
-    preparePermutation(kernel, work, 1, itsCut.permutation);
+    prepareInterleaver(kernel, work.interleaver[0], itsInverse);
+    prepareInterleaver(kernel, work.interleaver[1], itsCut.permutation);
+    preparePermutation(kernel, work.before, 0, 0, [&](unsigned segment) { return segment - 1; });
+    preparePermutation(kernel, work.after, 0, 0, [&](unsigned segment) { return segment + 1; });
     work.blockSize = itsCut.blockSize;
 }
 
@@ -122,18 +125,20 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
     space.windows = static_cast<unsigned>(windows);
     space.corrections = itsCorrections.data();
     for (const unsigned d : {0U, 1U}) {
-        work.sourceRow[d] = layout.take<std::uint32_t>(steps() + fetchAhead);
-        work.permutations[d] = layout.take<std::uint8_t>(steps() * std::size_t{kernel.permutationBytes});
+        work.interleaver[d] = takePermutations(kernel, layout, steps() + fetchAhead);
         space.constituent[d] = {layout.take<std::int16_t>(rows),
                                 layout.take<std::int16_t>(rows),
                                 layout.take<std::int16_t>(rows),
-                                work.sourceRow[d],
-                                work.permutations[d],
+                                {work.interleaver[d].sources, work.interleaver[d].controls},
                                 layout.take<std::int16_t>(states * row),
                                 layout.take<std::int16_t>(windows * states * row),
-                                layout.take<std::int16_t>(reachedWords(kernel)),
-                                layout.take<std::int16_t>(reachedWords(kernel))};
+                                layout.take<std::int16_t>(states * row),
+                                layout.take<std::int16_t>(states * row)};
     }
+    work.before = takePermutations(kernel, layout, 1);
+    work.after = takePermutations(kernel, layout, 1);
+    space.before = {work.before.sources, work.before.controls};
+    space.after = {work.after.sources, work.after.controls};
     space.firstLanes = work.firstLanes = layout.take<std::int16_t>(row);
     space.lastLanes = work.lastLanes = layout.take<std::int16_t>(row);
     space.slots = layout.take<std::int16_t>(std::size_t{longestWindow} * kernel.slotBytes / 2);
@@ -144,25 +149,38 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
 
 /// The interleaver is contention-free: the positions that one step of all segments takes its values from
 /// are one step of all segments in the other order, too.
-void LaneDecoder::preparePermutation(const Kernel& kernel,
-                                     Work& work,
-                                     unsigned d,
+void LaneDecoder::prepareInterleaver(const Kernel& kernel,
+                                     const RowPermutations& rows,
                                      const std::vector<unsigned>& from) const
 {
-    std::uint8_t* control = work.permutations[d];
-    std::uint8_t source[mostLanes] = {};
     for (unsigned k = 0; k < steps(); ++k) {
         const unsigned sourceRow = from[k] % steps();
-        for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
-            const unsigned segment = lane % itsCut.segments;
-            const unsigned sourceSegment = (from[k + segment * steps()] - sourceRow) / steps();
-            source[lane] = static_cast<std::uint8_t>(lane - segment + sourceSegment);
-        }
-        kernel.prepare(source, control);
-        control += kernel.permutationBytes;
-        work.sourceRow[d][k] = sourceRow;
+        preparePermutation(kernel, rows, k, sourceRow, [&](unsigned segment) {
+            return (from[k + segment * steps()] - sourceRow) / steps();
+        });
     }
-    std::fill_n(work.sourceRow[d] + steps(), fetchAhead, 0U);
+    std::fill_n(rows.sources + std::size_t{steps()} * kernel.sources, fetchAhead * kernel.sources, 0U);
+}
+
+/// Row `row` takes its values from row `sourceRow`, each segment from segment sourceOf(segment), modulo the
+/// number of segments.
+template <class SourceOf>
+void LaneDecoder::preparePermutation(
+    const Kernel& kernel, const RowPermutations& rows, unsigned row, unsigned sourceRow, SourceOf sourceOf) const
+{
+    const LaneOrder order(itsCut.segments, kernel.groupLanes);
+    const auto sourceLane = [&](unsigned lane) {
+        return order.lane(order.block(lane), sourceOf(order.segment(lane)) % itsCut.segments);
+    };
+    std::uint8_t withinGroup[mostLanes] = {};
+    for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
+        withinGroup[lane] = static_cast<std::uint8_t>(sourceLane(lane) % kernel.groupLanes);
+    }
+    kernel.prepare(withinGroup, rows.controls + std::size_t{row} * kernel.permutationBytes);
+    for (unsigned i = 0; i < kernel.sources; ++i) {
+        const unsigned first = sourceLane(i * (kernel.lanes / kernel.sources));
+        rows.sources[row * kernel.sources + i] = sourceRow * kernel.lanes + first - first % kernel.groupLanes;
+    }
 }
 
 template <class Input>
@@ -194,9 +212,10 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
                              unsigned s,
                              std::int16_t* rows)
 {
+    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
     const Input* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
-        lanes[lane] = blocks[blockOf(lane)].*stream + lane % itsCut.segments * steps();
+        lanes[lane] = blocks[blockOf(lane)].*stream + order.segment(lane) * steps();
     }
     bool within = loadRows(*itsKernel, lanes, steps(), rows);
     for (unsigned block = 0; block < itsBlocks; ++block) {
@@ -234,17 +253,19 @@ void LaneDecoder::prepareStarts(unsigned d)
     std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * row;
     std::fill_n(alpha, states * row, std::int16_t{0});
     std::fill(beta, lastBeta + states * row, std::int16_t{0});
-    std::fill_n(space.constituent[d].alphaReached, reachedWords(*itsKernel), std::int16_t{0});
-    std::fill_n(space.constituent[d].betaReached, reachedWords(*itsKernel), std::int16_t{0});
-    for (unsigned first = 0; first < itsKernel->lanes; first += itsCut.segments) {
+    std::fill_n(space.constituent[d].alphaReached, states * row, std::int16_t{0});
+    std::fill_n(space.constituent[d].betaReached, states * row, std::int16_t{0});
+    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
+    for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments; ++block) {
+        const unsigned first = order.lane(block, 0);
+        const unsigned last = order.lane(block, itsCut.segments - 1);
         const std::array<int, 12>& t = itsTails[blockOf(first)];
         const unsigned o = 6 * d;
         const auto metrics =
             trellis::tailColumn<int>({{t[o], t[o + 2], t[o + 4]}, {t[o + 1], t[o + 3], t[o + 5]}, {0, 0, 0}});
         for (unsigned state = 0; state < states; ++state) {
             alpha[state * row + first] = state == 0 ? 0 : unlikely;
-            lastBeta[state * row + first + itsCut.segments - 1] =
-                static_cast<std::int16_t>(metrics[state] & borderMask);
+            lastBeta[state * row + last] = static_cast<std::int16_t>(metrics[state] & borderMask);
         }
     }
 }
@@ -255,10 +276,11 @@ void LaneDecoder::spread(void (*store)(const std::int16_t*, unsigned, Output* co
                          Output* const* blocks)
 {
     Output scratch[mostSteps];  // what the lanes without a block give
+    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
     Output* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
-        const unsigned block = lane / itsCut.segments;
-        lanes[lane] = block < itsBlocks ? blocks[block] + lane % itsCut.segments * steps() : scratch;
+        const unsigned block = order.block(lane);
+        lanes[lane] = block < itsBlocks ? blocks[block] + order.segment(lane) * steps() : scratch;
     }
     store(rows, steps(), lanes);
 }
@@ -280,6 +302,7 @@ void LaneDecoder::joint(std::int16_t* const* blocks)
 
 LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
 {
+    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
     LoadedBlock streams;
     const ConstituentRows* const rows = itsCurrent->space.constituent;
     const std::int16_t* const sources[3] = {rows[0].systematic, rows[0].parity, rows[1].parity};
@@ -288,7 +311,7 @@ LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
         values.reserve(itsCut.blockSize + tailPositions);
         for (unsigned segment = 0; segment < itsCut.segments; ++segment) {
             for (unsigned k = 0; k < steps(); ++k) {
-                values.push_back(sources[s][k * itsKernel->lanes + block * itsCut.segments + segment]);
+                values.push_back(sources[s][k * itsKernel->lanes + order.lane(block, segment)]);
             }
         }
         for (unsigned position = 0; position < tailPositions; ++position) {

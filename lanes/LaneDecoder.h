@@ -38,6 +38,12 @@ using LoadedBlock = std::array<std::vector<std::int16_t>, 3>;
 /// serves all greater ones.
 using CorrectionTable = std::array<std::uint8_t, 16>;
 
+/// Permutations (Workspace.h) while they are prepared.
+struct RowPermutations {
+    std::uint32_t* sources;
+    std::uint8_t* controls;
+};
+
 /// Use: setBlockCut whenever the size changes; then, for some blocks, load, decode and fetch results.
 class LaneDecoder {
 public:
@@ -83,8 +89,9 @@ private:
     struct Work {
         unsigned blockSize = 0;  ///< 0: none
         std::vector<unsigned char> storage;
-        std::uint32_t* sourceRow[2] = {};
-        std::uint8_t* permutations[2] = {};
+        RowPermutations interleaver[2] = {};
+        RowPermutations before = {};
+        RowPermutations after = {};
         std::int16_t* firstLanes = nullptr;
         std::int16_t* lastLanes = nullptr;
         Workspace space = {};
@@ -94,7 +101,10 @@ private:
     unsigned blockOf(unsigned lane) const;
     void prepareWork(const Kernel& kernel, Work& work) const;
     std::size_t layOut(const Kernel& kernel, Work& work, unsigned char* base) const;
-    void preparePermutation(const Kernel& kernel, Work& work, unsigned d, const std::vector<unsigned>& from) const;
+    void prepareInterleaver(const Kernel& kernel, const RowPermutations& rows, const std::vector<unsigned>& from) const;
+    template <class SourceOf>
+    void preparePermutation(
+        const Kernel& kernel, const RowPermutations& rows, unsigned row, unsigned sourceRow, SourceOf sourceOf) const;
     void prepareStarts(unsigned d);
 
     template <class Input>

@@ -22,10 +22,9 @@ class Pass {
     static constexpr unsigned count = Rule::count;
     static constexpr unsigned states = trellis::stateCount;
     static constexpr unsigned row = vectors * count;
-    static constexpr unsigned wideRow = row + 2 * count;
     using Value = Steps<count>;
-    using Values = StepsColumn<count>;
     using BranchMetrics = StepsBranches<count>;
+    using Lanes = Permutation<count, vectors>;
     using Decision = typename Rule::Decision;
     using Column = trellis::Column<Decision>;
 
@@ -44,8 +43,7 @@ public:
         : w(workspace),
           itsRows(workspace.constituent[d]),
           itsSource(joint),
-          itsSourceRow(itsRows.sourceRow),
-          itsPermutations(itsRows.permutations),
+          itsInterleaver(itsRows.interleaver),
           itsParity(itsRows.parity),
           itsSystematic(itsRows.systematic),
           itsJoint(itsRows.joint),
@@ -62,7 +60,7 @@ public:
         // The last row starts from what the first row reached: in this pass, when there is a row between
         // them in which the hardware can hand it on (rule 20), else in the pass before.
         const bool handedWithin = !first && w.windows > 2;
-        hand(itsRows.alphaReached + count - 1, itsRows.alphaStart, w.firstLanes);
+        hand(itsRows.alphaReached, w.before, itsRows.alphaStart, w.firstLanes);
         if (!handedWithin) {
             handBack();
         }
@@ -82,7 +80,7 @@ public:
             }
         }
         for (unsigned v = 0; v < vectors; ++v) {
-            storeBorder(restoreForward(v), itsRows.alphaReached + (v + 1) * count, wideRow);
+            storeBorder(restoreForward(v), itsRows.alphaReached + v * count);
         }
     }
 
@@ -191,10 +189,10 @@ private:
 
     MORVIK_INLINE void forwardStep(unsigned k, unsigned v, std::int16_t* slot, Column& a) const
     {
-        using Lanes = Permutation<count, vectors>;
-        const std::int16_t* source = itsSource + itsSourceRow[k] * row;
-        __builtin_prefetch(itsSource + itsSourceRow[k + lanes::fetchAhead] * row);
-        const Value joint = Lanes::load(source, itsPermutations + (k * vectors + v) * Lanes::bytes);
+        const unsigned i = k * vectors + v;
+        const std::uint32_t* const sources = itsInterleaver.sources + i * Lanes::sources;
+        __builtin_prefetch(itsSource + sources[lanes::fetchAhead * vectors * Lanes::sources]);
+        const Value joint = Lanes::load(itsSource, sources, itsInterleaver.controls + i * Lanes::bytes);
         BranchMetrics g = trellis::branchSums(joint, Value::load(itsParity + at(k, v)), Value{});
         for (Value& metric : g) {
             metric = clip(metric, lanes::branchMin, lanes::branchMax);
@@ -213,20 +211,12 @@ private:
         const Value g0 = Value::load(slot + slotBranches);
         const Value g1 = Value::load(slot + slotBranches + count);
         const BranchMetrics g = {g0, g1, g1, g0};
-        Values alpha{};
-        Values beta{};
-        trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
-            alpha[state] = Value::load(slot + state * count);
-            beta[state] = Decision::stored(b[state]);
-        });
-        const auto c = trellis::candidates(itsRule.decision(), b, g);
-        const Value ratio = itsRule.ratio(alpha, beta, g, c);
+        const Value ratio = itsRule.stepBack({slot}, b, g);
         if constexpr (last) {
             ratio.store(itsRatios + at(k, v));
         }
         const Value joint = Value::load(slot + slotJoint);
         nextJoint(ratio, joint, Value::load(itsSystematic + at(k, v))).store(itsJoint + at(k, v));
-        b = trellis::backwardStep(itsRule.decision(), c);
     }
 
     /// The extrinsic value x = ratio - 2 joint is scaled, rounded down to a step and clipped (rule 14), and
@@ -273,10 +263,10 @@ private:
     }
 
     /// Stores a border column (rule 11).
-    static MORVIK_INLINE void storeBorder(const Column& m, std::int16_t* column, unsigned stride)
+    static MORVIK_INLINE void storeBorder(const Column& m, std::int16_t* column)
     {
         trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
-            (Decision::stored(m[state]) & Value::of(lanes::borderMask)).store(column + state * stride);
+            (Decision::stored(m[state]) & Value::of(lanes::borderMask)).store(column + state * row);
         });
     }
 
@@ -286,23 +276,27 @@ private:
     {
         const Column m = broughtBack(b);
         if (window.r == 0) {
-            storeBorder(m, itsRows.betaReached + (window.v + 1) * count, wideRow);
+            storeBorder(m, itsRows.betaReached + window.v * count);
         } else {
-            storeBorder(m, itsRows.betaStart + (window.r - 1) * states * row + window.v * count, row);
+            storeBorder(m, itsRows.betaStart + (window.r - 1) * states * row + window.v * count);
         }
     }
 
     MORVIK_INLINE void handBack() const
     {
-        hand(itsRows.betaReached + count + 1, itsRows.betaStart + (w.windows - 1) * states * row, w.lastLanes);
+        hand(itsRows.betaReached, w.after, itsRows.betaStart + (w.windows - 1) * states * row, w.lastLanes);
     }
 
-    /// Columns move to a neighbouring lane, but for the lanes at a block's border, which keep theirs.
-    MORVIK_INLINE void hand(const std::int16_t* from, std::int16_t* to, const std::int16_t* keep) const
+    /// Columns move to a neighbouring segment's lane, but for the segments at a block's border, which keep theirs.
+    MORVIK_INLINE void hand(const std::int16_t* columns,
+                            const lanes::Permutations& from,
+                            std::int16_t* to,
+                            const std::int16_t* keep) const
     {
         for (unsigned state = 0; state < states; ++state) {
             for (unsigned v = 0; v < vectors; ++v) {
-                const Value moved = Value::loadUnaligned(from + state * wideRow + v * count);
+                const Value moved = Lanes::load(
+                    columns + state * row, from.sources + v * Lanes::sources, from.controls + v * Lanes::bytes);
                 std::int16_t* start = to + state * row + v * count;
                 blend(Value::load(keep + v * count), moved, Value::load(start)).store(start);
             }
@@ -314,8 +308,7 @@ private:
 
     // What every step uses, at hand: stores of values might change what is behind a reference.
     const std::int16_t* const itsSource;  ///< joint values of the other decoder
-    const std::uint32_t* const itsSourceRow;
-    const std::uint8_t* const itsPermutations;
+    const lanes::Permutations itsInterleaver;
     const std::int16_t* const itsParity;
     const std::int16_t* const itsSystematic;
     std::int16_t* const itsJoint;

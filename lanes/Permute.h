@@ -7,8 +7,10 @@
 
 namespace MORVIK_LANES {
 
-// A permutation of the lanes of a row of `vectors` vectors is prepared as a control of `bytes` bytes for each
-// vector of the result; lane l of that vector takes the row's lane source[l].
+// Rows are taken from other rows, their lanes permuted. The lanes of a row form groups of `group`, each of which
+// takes all of its values from one group of the source row: LaneOrder.h puts segments in an order for which the
+// interleaver does so. A vector's permutation is prepared as `sources` places of such groups, in words from the
+// beginning of the rows, and a control of `bytes` bytes, which says from which lane of its group each lane comes.
 
 #if defined(__AVX512BW__) && defined(__AVX512VL__)
 
@@ -29,6 +31,8 @@ MORVIK_INLINE Steps<count> permuteWords(Steps<count> a, typename Steps<count>::V
 template <unsigned count, unsigned vectors>
 struct Permutation {
     static_assert(vectors == 1);
+    static constexpr unsigned group = count;
+    static constexpr unsigned sources = 1;
     static constexpr unsigned bytes = 2 * count;
 
     static void prepare(const std::uint8_t* source, std::uint8_t* control)
@@ -39,53 +43,47 @@ struct Permutation {
         }
     }
 
-    static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
+    static MORVIK_INLINE Steps<count> load(const std::int16_t* rows,
+                                           const std::uint32_t* from,
+                                           const std::uint8_t* control)
     {
         typename Steps<count>::Vector index;
         std::memcpy(&index, control, sizeof index);
-        return permuteWords<count>(Steps<count>::load(row), index);
+        return permuteWords<count>(Steps<count>::load(rows + *from), index);
     }
 };
 
 #elif defined(__SSSE3__)
 
-/// A byte shuffle for each sixteen bytes of the row; those that take nothing from them give zeros.
+/// A byte shuffle within each sixteen bytes.
 template <unsigned count, unsigned vectors>
 struct Permutation {
-    static constexpr unsigned pieces = vectors * count / 8;
-    static constexpr unsigned bytes = pieces * 2 * count;
+    static constexpr unsigned group = 8;
+    static constexpr unsigned sources = count / group;
+    static constexpr unsigned bytes = 2 * count;
 
     static void prepare(const std::uint8_t* source, std::uint8_t* control)
     {
-        for (unsigned piece = 0; piece < pieces; ++piece) {
-            for (unsigned lane = 0; lane < count; ++lane) {
-                const unsigned from = 2U * source[lane] - 16 * piece;
-                *control++ = static_cast<std::uint8_t>(from < 16 ? from : 0x80);
-                *control++ = static_cast<std::uint8_t>(from < 16 ? from + 1 : 0x80);
-            }
+        for (unsigned lane = 0; lane < count; ++lane) {
+            control[2 * lane] = static_cast<std::uint8_t>(2 * source[lane]);
+            control[2 * lane + 1] = static_cast<std::uint8_t>(2 * source[lane] + 1);
         }
     }
 
-    static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
+    static MORVIK_INLINE Steps<count> load(const std::int16_t* rows,
+                                           const std::uint32_t* from,
+                                           const std::uint8_t* control)
     {
-        Steps<count> result = shuffle(row, control);
-        trellis::forEach<pieces - 1>([&](auto piece) MORVIK_INLINE_LAMBDA {
-            result.v |= shuffle(row + 8 * (piece + 1), control + (piece + 1) * 2 * count).v;
-        });
-        return result;
-    }
-
-private:
-    static MORVIK_INLINE Steps<count> shuffle(const std::int16_t* piece, const std::uint8_t* control)
-    {
-        const __m128i words = _mm_load_si128(reinterpret_cast<const __m128i*>(piece));
-        const void* const select = control;
-        if constexpr (count == 8) {
-            return {(Steps<8>::Vector)_mm_shuffle_epi8(words, _mm_load_si128(static_cast<const __m128i*>(select)))};
+        using Vector = typename Steps<count>::Vector;
+        Vector select;
+        std::memcpy(&select, control, sizeof select);
+        const __m128i first = (__m128i)Steps<group>::load(rows + from[0]).v;
+        if constexpr (count == group) {
+            return {(Vector)_mm_shuffle_epi8(first, (__m128i)select)};
         } else {
 #if defined(__AVX2__)
-            return {(Steps<16>::Vector)_mm256_shuffle_epi8(_mm256_broadcastsi128_si256(words),
-                                                           _mm256_load_si256(static_cast<const __m256i*>(select)))};
+            const __m128i second = (__m128i)Steps<group>::load(rows + from[1]).v;
+            return {(Vector)_mm256_shuffle_epi8(_mm256_set_m128i(second, first), (__m256i)select)};
 #endif
         }
     }
@@ -96,6 +94,8 @@ private:
 /// The source lanes themselves.
 template <unsigned count, unsigned vectors>
 struct Permutation {
+    static constexpr unsigned group = count * vectors;
+    static constexpr unsigned sources = 1;
     static constexpr unsigned bytes = count;
 
     static void prepare(const std::uint8_t* source, std::uint8_t* control)
@@ -103,11 +103,13 @@ struct Permutation {
         std::memcpy(control, source, count);
     }
 
-    static MORVIK_INLINE Steps<count> load(const std::int16_t* row, const std::uint8_t* control)
+    static MORVIK_INLINE Steps<count> load(const std::int16_t* rows,
+                                           const std::uint32_t* from,
+                                           const std::uint8_t* control)
     {
         Steps<count> result{};
         for (unsigned lane = 0; lane < count; ++lane) {
-            result.v[lane] = row[control[lane]];
+            result.v[lane] = rows[*from + control[lane]];
         }
         return result;
     }

@@ -15,6 +15,17 @@ using StepsColumn = std::array<Steps<count>, trellis::stateCount>;
 template <unsigned count>
 using StepsBranches = trellis::BranchMetrics<Steps<count>>;
 
+/// The eight metrics of a slot, side by side in memory.
+template <unsigned count>
+struct StoredColumn {
+    const std::int16_t* metrics;
+
+    MORVIK_INLINE Steps<count> operator[](unsigned state) const
+    {
+        return Steps<count>::load(metrics + state * count);
+    }
+};
+
 /// "MOD": max-log-MAP.
 template <unsigned countOfLanes>
 struct Greatest {
@@ -29,21 +40,24 @@ struct Greatest {
         return {};
     }
 
-    /// The greatest of all does not depend on the order of comparison, nor on when the branch metric is
-    /// added: the candidates of the backward recursion serve once more.
-    static MORVIK_INLINE Steps<count> ratio(const StepsColumn<count>& a,
-                                            const StepsColumn<count>&,
-                                            const StepsBranches<count>&,
-                                            const trellis::Candidates<Decision>& c)
+    /// Takes b a step back and gives the step's ratio. The greatest of all does not depend on the order of
+    /// comparison, nor on when the branch metric is added: the candidates of the backward recursion serve
+    /// once more, pair by pair.
+    MORVIK_INLINE Steps<count> stepBack(const StoredColumn<count>& a,
+                                        trellis::Column<Decision>& b,
+                                        const StepsBranches<count>& g) const
     {
-        return greatest(a, c.one) - greatest(a, c.zero);
-    }
-
-private:
-    static MORVIK_INLINE Steps<count> greatest(const StepsColumn<count>& a, const StepsColumn<count>& c)
-    {
-        return max(max(max(a[0] + c[0], a[1] + c[1]), max(a[2] + c[2], a[3] + c[3])),
-                   max(max(a[4] + c[4], a[5] + c[5]), max(a[6] + c[6], a[7] + c[7])));
+        Steps<count> one{};
+        Steps<count> zero{};
+        b = trellis::backwardStep(decision(), b, g, [&](auto pair, const auto& c) MORVIK_INLINE_LAMBDA {
+            const Steps<count> even = a[2 * pair];
+            const Steps<count> odd = a[2 * pair + 1];
+            const Steps<count> bestOne = max(even + c.one[0], odd + c.one[1]);
+            const Steps<count> bestZero = max(even + c.zero[0], odd + c.zero[1]);
+            one = pair == 0 ? bestOne : max(one, bestOne);
+            zero = pair == 0 ? bestZero : max(zero, bestZero);
+        });
+        return one - zero;
     }
 };
 
@@ -74,12 +88,18 @@ struct Corrected {
         return Decision(corrections);
     }
 
-    MORVIK_INLINE Steps<count> ratio(const StepsColumn<count>& a,
-                                     const StepsColumn<count>& b,
-                                     const StepsBranches<count>& g,
-                                     const trellis::Candidates<Decision>&) const
+    MORVIK_INLINE Steps<count> stepBack(const StoredColumn<count>& a,
+                                        trellis::Column<Decision>& b,
+                                        const StepsBranches<count>& g) const
     {
-        return trellis::logLikelihoodRatio(decision(), a, b, g);
+        StepsColumn<count> alpha{};
+        StepsColumn<count> beta{};
+        trellis::forEach<trellis::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
+            alpha[state] = a[state];
+            beta[state] = Decision::stored(b[state]);
+        });
+        b = trellis::backwardStep(decision(), b, g);
+        return trellis::logLikelihoodRatio(decision(), alpha, beta, g);
     }
 };
 

@@ -45,13 +45,6 @@ struct Steps {
         return {v};
     }
 
-    static MORVIK_INLINE Steps loadUnaligned(const std::int16_t* from)
-    {
-        Vector v;
-        std::memcpy(&v, from, sizeof v);
-        return {v};
-    }
-
     MORVIK_INLINE void store(std::int16_t* to) const
     {
         std::memcpy(__builtin_assume_aligned(to, sizeof v), &v, sizeof v);

@@ -78,7 +78,7 @@ T8* backward(const Decision& rule, unsigned n, const T8* g, T8* b)
 {
     auto metrics = load(rule, *b);
     for (unsigned j = 1; j < n; ++j) {
-        metrics = trellis::backwardStep(rule, trellis::candidates(rule, metrics, branchMetrics(*g--)));
+        metrics = trellis::backwardStep(rule, metrics, branchMetrics(*g--));
         store(rule, metrics, *--b);
     }
     return b - 1;

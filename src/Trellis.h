@@ -98,38 +98,48 @@ MORVIK_INLINE constexpr Column<Decision> forwardStep(const Decision& rule,
     return next;
 }
 
-/// The metrics of the two branches that leave each state, the backward metric of the far end included.
+/// The metrics of the branches that leave the two states of a pair, the even state's first, the backward
+/// metric of the far end included.
 template <class Decision>
 struct Candidates {
-    Column<Decision> one;   ///< on bit 1
-    Column<Decision> zero;  ///< on bit 0
+    typename Decision::Metric one[2];   ///< on bit 1
+    typename Decision::Metric zero[2];  ///< on bit 0
 };
 
-template <class Decision, class Value>
-MORVIK_INLINE constexpr Candidates<Decision> candidates(const Decision& rule,
-                                                        const Column<Decision>& b,
-                                                        const BranchMetrics<Value>& g)
+template <unsigned pair, class Decision, class Value>
+MORVIK_INLINE constexpr Candidates<Decision> candidates(const Decision& rule, const Column<Decision>& b, Value g)
 {
-    Candidates<Decision> c{};
-    forEach<stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
-        constexpr unsigned afterOne = successor(state, 1);
-        constexpr unsigned afterZero = successor(state, 0);
-        constexpr unsigned pair = branch(state);
-        c.one[state] = rule.add(b[afterOne], g[pair]);
-        c.zero[state] = rule.subtract(b[afterZero], g[pair]);
-    });
-    return c;
+    constexpr unsigned even = 2 * pair;
+    constexpr unsigned odd = 2 * pair + 1;
+    return {{rule.add(b[successor(even, 1)], g), rule.add(b[successor(odd, 1)], g)},
+            {rule.subtract(b[successor(even, 0)], g), rule.subtract(b[successor(odd, 0)], g)}};
 }
 
 /// Backward: the column before a step, each state decided between its two successors, the one on bit 1
-/// first (rule 6).
-template <class Decision>
-MORVIK_INLINE constexpr Column<Decision> backwardStep(const Decision& rule, const Candidates<Decision>& c)
+/// first (rule 6). The states of a pair have the same successors, so a pair is done before the next begins;
+/// use(pair, candidates) is told what it was decided from.
+template <class Decision, class Value, class Use>
+MORVIK_INLINE constexpr Column<Decision> backwardStep(const Decision& rule,
+                                                      const Column<Decision>& b,
+                                                      const BranchMetrics<Value>& g,
+                                                      Use use)
 {
     Column<Decision> previous{};
-    forEach<stateCount>([&](auto state)
-                            MORVIK_INLINE_LAMBDA { previous[state] = rule.decide(c.one[state], c.zero[state]); });
+    forEach<stateCount / 2>([&](auto pair) MORVIK_INLINE_LAMBDA {
+        const Candidates<Decision> c = candidates<pair>(rule, b, g[pair]);
+        use(pair, c);
+        previous[2 * pair] = rule.decide(c.one[0], c.zero[0]);
+        previous[2 * pair + 1] = rule.decide(c.one[1], c.zero[1]);
+    });
     return previous;
+}
+
+template <class Decision, class Value>
+MORVIK_INLINE constexpr Column<Decision> backwardStep(const Decision& rule,
+                                                      const Column<Decision>& b,
+                                                      const BranchMetrics<Value>& g)
+{
+    return backwardStep(rule, b, g, [](auto, const Candidates<Decision>&) {});
 }
 
 /// The best metric of all branches with `bit`, as a tree of decisions: the two states of a pair
