@@ -12,23 +12,22 @@ struct Shape {
     static constexpr unsigned lanes = count * vectors;
     using LanesOfRow = Permutation<count, vectors>;
 
-    static void prepare(const std::uint8_t* source, std::uint8_t* control)
-    {
-        for (std::size_t v = 0; v < vectors; ++v) {
-            LanesOfRow::prepare(source + v * count, control + v * LanesOfRow::bytes);
-        }
-    }
-
     template <class Input>
     static bool load(const Input* const* arrays, unsigned steps, std::int16_t* rows)
     {
-        return loadRows(arrays, lanes, steps, rows);
+        bool within = true;
+        for (std::size_t v = 0; v < vectors; ++v) {
+            within = loadRows<count>(arrays + v * count, steps, rows + v * steps * count) && within;
+        }
+        return within;
     }
 
     template <class Output>
     static void store(const std::int16_t* rows, unsigned steps, Output* const* arrays)
     {
-        storeRows(rows, lanes, steps, arrays);
+        for (std::size_t v = 0; v < vectors; ++v) {
+            storeRows<count>(rows + v * steps * count, steps, arrays + v * count);
+        }
     }
 
     static void decode(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned halfIterations)
@@ -79,11 +78,11 @@ struct Shape {
     static constexpr lanes::Kernel kernel = {lanes,
                                              count,
                                              LanesOfRow::group,
-                                             vectors* LanesOfRow::sources,
-                                             vectors* LanesOfRow::bytes,
+                                             LanesOfRow::sources,
+                                             LanesOfRow::bytes,
                                              slotBytes,
                                              forwardBytes,
-                                             prepare,
+                                             LanesOfRow::prepare,
                                              load<std::int32_t>,
                                              load<std::int16_t>,
                                              load<std::int8_t>,

@@ -16,12 +16,12 @@ struct Kernel {
     unsigned lanes;             ///< of a row
     unsigned vectorLanes;       ///< of a vector
     unsigned groupLanes;        ///< of a group, whose lanes come from one group of a source row (Permute.h)
-    unsigned sources;           ///< groups that a row's permutation names
-    unsigned permutationBytes;  ///< that prepare writes for a row
+    unsigned sources;           ///< groups that a vector's permutation names
+    unsigned permutationBytes;  ///< that prepare writes for a vector
     unsigned slotBytes;         ///< of one step of a window
     unsigned forwardBytes;      ///< of the forward recursion's state
 
-    /// Makes the control by which lane l of a row is taken from the lane source[l] of its source group.
+    /// Makes the control by which lane l of a vector is taken from lane source[l] of its source group.
     void (*prepare)(const std::uint8_t* source, std::uint8_t* control);
 
     /// Fills rows from one array for each lane, which holds `steps` values; false when a value was beyond

@@ -7,7 +7,6 @@
 #include "../src/Trellis.h"
 #include "Bounds.h"
 #include "InstructionSets.h"
-#include "LaneOrder.h"
 
 namespace lanes {
 
@@ -43,10 +42,12 @@ private:
     std::size_t itsSize = 0;
 };
 
-RowPermutations takePermutations(const Kernel& kernel, Layout& layout, std::size_t rows)
+RowPermutations takePermutations(const Kernel& kernel, Layout& layout, unsigned rows)
 {
-    return {layout.take<std::uint32_t>(rows * kernel.sources),
-            layout.take<std::uint8_t>(rows * kernel.permutationBytes)};
+    const std::size_t vectors = std::size_t{rows} * (kernel.lanes / kernel.vectorLanes);
+    return {rows,
+            layout.take<std::uint32_t>((vectors + fetchAhead) * kernel.sources),
+            layout.take<std::uint8_t>(vectors * kernel.permutationBytes)};
 }
 
 bool loadRows(const Kernel& kernel, const std::int32_t* const* arrays, unsigned steps, std::int16_t* rows)
@@ -102,7 +103,7 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
     void* base = work.storage.data();
     std::size_t space = work.storage.size();
     layOut(kernel, work, static_cast<unsigned char*>(std::align(Layout::line, 1, base, space)));
-    const LaneOrder order(itsCut.segments, kernel.groupLanes);
+    const LaneOrder order = laneOrder(kernel);
     for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
         work.firstLanes[lane] = order.segment(lane) == 0 ? -1 : 0;
         work.lastLanes[lane] = order.segment(lane) == itsCut.segments - 1 ? -1 : 0;
@@ -125,7 +126,7 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
     space.windows = static_cast<unsigned>(windows);
     space.corrections = itsCorrections.data();
     for (const unsigned d : {0U, 1U}) {
-        work.interleaver[d] = takePermutations(kernel, layout, steps() + fetchAhead);
+        work.interleaver[d] = takePermutations(kernel, layout, steps());
         space.constituent[d] = {layout.take<std::int16_t>(rows),
                                 layout.take<std::int16_t>(rows),
                                 layout.take<std::int16_t>(rows),
@@ -159,7 +160,9 @@ void LaneDecoder::prepareInterleaver(const Kernel& kernel,
             return (from[k + segment * steps()] - sourceRow) / steps();
         });
     }
-    std::fill_n(rows.sources + std::size_t{steps()} * kernel.sources, fetchAhead * kernel.sources, 0U);
+    std::fill_n(rows.sources + rows.count * (kernel.lanes / kernel.vectorLanes) * kernel.sources,
+                fetchAhead * kernel.sources,
+                0U);
 }
 
 /// Row `row` takes its values from row `sourceRow`, each segment from segment sourceOf(segment), modulo the
@@ -168,19 +171,30 @@ template <class SourceOf>
 void LaneDecoder::preparePermutation(
     const Kernel& kernel, const RowPermutations& rows, unsigned row, unsigned sourceRow, SourceOf sourceOf) const
 {
-    const LaneOrder order(itsCut.segments, kernel.groupLanes);
+    const LaneOrder order = laneOrder(kernel);
     const auto sourceLane = [&](unsigned lane) {
         return order.lane(order.block(lane), sourceOf(order.segment(lane)) % itsCut.segments);
     };
-    std::uint8_t withinGroup[mostLanes] = {};
-    for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
-        withinGroup[lane] = static_cast<std::uint8_t>(sourceLane(lane) % kernel.groupLanes);
+    const unsigned vectorLanes = kernel.vectorLanes;
+    for (unsigned v = 0; v < kernel.lanes / vectorLanes; ++v) {
+        const std::size_t at = v * rows.count + row;
+        std::uint8_t withinGroup[mostLanes] = {};
+        for (unsigned lane = 0; lane < vectorLanes; ++lane) {
+            withinGroup[lane] = static_cast<std::uint8_t>(sourceLane(v * vectorLanes + lane) % kernel.groupLanes);
+        }
+        kernel.prepare(withinGroup, rows.controls + at * kernel.permutationBytes);
+        for (unsigned i = 0; i < kernel.sources; ++i) {
+            const unsigned lane = sourceLane(v * vectorLanes + i * kernel.groupLanes);
+            const unsigned group = lane - lane % kernel.groupLanes;
+            rows.sources[at * kernel.sources + i] =
+                (group / vectorLanes * rows.count + sourceRow) * vectorLanes + group % vectorLanes;
+        }
     }
-    kernel.prepare(withinGroup, rows.controls + std::size_t{row} * kernel.permutationBytes);
-    for (unsigned i = 0; i < kernel.sources; ++i) {
-        const unsigned first = sourceLane(i * (kernel.lanes / kernel.sources));
-        rows.sources[row * kernel.sources + i] = sourceRow * kernel.lanes + first - first % kernel.groupLanes;
-    }
+}
+
+LaneOrder LaneDecoder::laneOrder(const Kernel& kernel) const
+{
+    return {itsCut.segments, kernel.groupLanes, kernel.vectorLanes};
 }
 
 template <class Input>
@@ -212,7 +226,7 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
                              unsigned s,
                              std::int16_t* rows)
 {
-    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
+    const LaneOrder order = laneOrder(*itsKernel);
     const Input* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
         lanes[lane] = blocks[blockOf(lane)].*stream + order.segment(lane) * steps();
@@ -255,7 +269,7 @@ void LaneDecoder::prepareStarts(unsigned d)
     std::fill(beta, lastBeta + states * row, std::int16_t{0});
     std::fill_n(space.constituent[d].alphaReached, states * row, std::int16_t{0});
     std::fill_n(space.constituent[d].betaReached, states * row, std::int16_t{0});
-    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
+    const LaneOrder order = laneOrder(*itsKernel);
     for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments; ++block) {
         const unsigned first = order.lane(block, 0);
         const unsigned last = order.lane(block, itsCut.segments - 1);
@@ -276,7 +290,7 @@ void LaneDecoder::spread(void (*store)(const std::int16_t*, unsigned, Output* co
                          Output* const* blocks)
 {
     Output scratch[mostSteps];  // what the lanes without a block give
-    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
+    const LaneOrder order = laneOrder(*itsKernel);
     Output* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
         const unsigned block = order.block(lane);
@@ -302,7 +316,8 @@ void LaneDecoder::joint(std::int16_t* const* blocks)
 
 LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
 {
-    const LaneOrder order(itsCut.segments, itsKernel->groupLanes);
+    const LaneOrder order = laneOrder(*itsKernel);
+    const unsigned vectorLanes = itsKernel->vectorLanes;
     LoadedBlock streams;
     const ConstituentRows* const rows = itsCurrent->space.constituent;
     const std::int16_t* const sources[3] = {rows[0].systematic, rows[0].parity, rows[1].parity};
@@ -310,8 +325,9 @@ LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
         std::vector<std::int16_t>& values = streams[s];
         values.reserve(itsCut.blockSize + tailPositions);
         for (unsigned segment = 0; segment < itsCut.segments; ++segment) {
+            const unsigned lane = order.lane(block, segment);
             for (unsigned k = 0; k < steps(); ++k) {
-                values.push_back(sources[s][k * itsKernel->lanes + order.lane(block, segment)]);
+                values.push_back(sources[s][(lane / vectorLanes * steps() + k) * vectorLanes + lane % vectorLanes]);
             }
         }
         for (unsigned position = 0; position < tailPositions; ++position) {

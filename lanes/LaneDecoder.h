@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "Kernels.h"
+#include "LaneOrder.h"
 
 namespace lanes {
 
@@ -40,6 +41,7 @@ using CorrectionTable = std::array<std::uint8_t, 16>;
 
 /// Permutations (Workspace.h) while they are prepared.
 struct RowPermutations {
+    unsigned count;  ///< of rows
     std::uint32_t* sources;
     std::uint8_t* controls;
 };
@@ -98,6 +100,7 @@ private:
     };
 
     unsigned steps() const;
+    LaneOrder laneOrder(const Kernel& kernel) const;
     unsigned blockOf(unsigned lane) const;
     void prepareWork(const Kernel& kernel, Work& work) const;
     std::size_t layOut(const Kernel& kernel, Work& work, unsigned char* base) const;

@@ -4,22 +4,28 @@
 
 namespace lanes {
 
-/// Blocks of `segments` segments, a power of two, share rows whose lanes form groups of `groupLanes`. A block of
-/// no more segments than that takes as many neighbouring lanes, in order. A larger one takes whole groups and
-/// deals its segments out to them in turn: a group holds the segments that are equal modulo the number q of the
-/// block's groups. So whatever the step, the interleaver takes the values of a group from one group: over the
-/// segments u of a step it is a quadratic permutation polynomial, c + a u + d u^2 with an odd a and an even d,
-/// and what such a polynomial gives modulo q depends on u modulo q alone.
+/// Blocks of `segments` segments, a power of two, share the vectors of a row, whose lanes form groups of
+/// `groupLanes`. A block of no more segments than that takes as many neighbouring lanes, in order. A larger one
+/// takes q whole groups and deals its segments out to them in turn: a group holds the segments that are equal
+/// modulo q, and a vector of several groups those that are equal modulo the number of the block's vectors. So
+/// whatever the step, the interleaver takes the values of a group from one group, and those of a vector from one
+/// vector: over the segments u of a step it is a quadratic permutation polynomial, c + a u + d u^2 with an odd a
+/// and an even d, and what such a polynomial gives modulo a power of two depends on u modulo that power alone.
 class LaneOrder {
 public:
-    LaneOrder(unsigned segments, unsigned groupLanes)
-        : itsSegments(segments), itsGroupLanes(groupLanes), itsGroups(segments > groupLanes ? segments / groupLanes : 1)
+    LaneOrder(unsigned segments, unsigned groupLanes, unsigned vectorLanes)
+        : itsSegments(segments),
+          itsGroupLanes(groupLanes),
+          itsGroups(segments > groupLanes ? segments / groupLanes : 1),
+          itsVectors(segments > vectorLanes ? segments / vectorLanes : 1)
     {
     }
 
     unsigned lane(unsigned block, unsigned segment) const
     {
-        return block * itsSegments + segment % itsGroups * itsGroupLanes + segment / itsGroups;
+        const unsigned residue = segment % itsGroups;
+        const unsigned group = residue % itsVectors * (itsGroups / itsVectors) + residue / itsVectors;
+        return block * itsSegments + group * itsGroupLanes + segment / itsGroups;
     }
 
     unsigned block(unsigned lane) const
@@ -30,13 +36,17 @@ public:
     unsigned segment(unsigned lane) const
     {
         const unsigned within = lane % itsSegments;
-        return within % itsGroupLanes * itsGroups + within / itsGroupLanes;
+        const unsigned group = within / itsGroupLanes;
+        const unsigned groupsOfVector = itsGroups / itsVectors;
+        const unsigned residue = group % groupsOfVector * itsVectors + group / groupsOfVector;
+        return within % itsGroupLanes * itsGroups + residue;
     }
 
 private:
     unsigned itsSegments;
     unsigned itsGroupLanes;
-    unsigned itsGroups;  ///< of a block
+    unsigned itsGroups;   ///< of a block, 1 if it is a part of one
+    unsigned itsVectors;  ///< of a block, 1 if it is a part of one
 };
 
 }  // namespace lanes

@@ -42,6 +42,7 @@ public:
     MORVIK_INLINE Pass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint)
         : w(workspace),
           itsRows(workspace.constituent[d]),
+          itsSteps(w.steps),
           itsSource(joint),
           itsInterleaver(itsRows.interleaver),
           itsParity(itsRows.parity),
@@ -189,9 +190,9 @@ private:
 
     MORVIK_INLINE void forwardStep(unsigned k, unsigned v, std::int16_t* slot, Column& a) const
     {
-        const unsigned i = k * vectors + v;
+        const unsigned i = v * itsSteps + k;
         const std::uint32_t* const sources = itsInterleaver.sources + i * Lanes::sources;
-        __builtin_prefetch(itsSource + sources[lanes::fetchAhead * vectors * Lanes::sources]);
+        __builtin_prefetch(itsSource + sources[lanes::fetchAhead * Lanes::sources]);
         const Value joint = Lanes::load(itsSource, sources, itsInterleaver.controls + i * Lanes::bytes);
         BranchMetrics g = trellis::branchSums(joint, Value::load(itsParity + at(k, v)), Value{});
         for (Value& metric : g) {
@@ -228,9 +229,9 @@ private:
         return clip(half, lanes::branchMin / 2, lanes::branchMax / 2) + systematic;
     }
 
-    static MORVIK_INLINE unsigned at(unsigned k, unsigned v)
+    MORVIK_INLINE unsigned at(unsigned k, unsigned v) const
     {
-        return (k * vectors + v) * count;
+        return (v * itsSteps + k) * count;
     }
 
     MORVIK_INLINE Column load(const std::int16_t* column) const
@@ -307,6 +308,7 @@ private:
     const lanes::ConstituentRows& itsRows;
 
     // What every step uses, at hand: stores of values might change what is behind a reference.
+    const unsigned itsSteps;
     const std::int16_t* const itsSource;  ///< joint values of the other decoder
     const lanes::Permutations itsInterleaver;
     const std::int16_t* const itsParity;

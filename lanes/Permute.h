@@ -94,8 +94,8 @@ struct Permutation {
 /// The source lanes themselves.
 template <unsigned count, unsigned vectors>
 struct Permutation {
-    static constexpr unsigned group = count * vectors;
-    static constexpr unsigned sources = 1;
+    static constexpr unsigned group = 8;
+    static constexpr unsigned sources = count / group;
     static constexpr unsigned bytes = count;
 
     static void prepare(const std::uint8_t* source, std::uint8_t* control)
@@ -109,7 +109,7 @@ struct Permutation {
     {
         Steps<count> result{};
         for (unsigned lane = 0; lane < count; ++lane) {
-            result.v[lane] = rows[*from + control[lane]];
+            result.v[lane] = rows[from[lane / group] + control[lane]];
         }
         return result;
     }

@@ -13,6 +13,7 @@ namespace MORVIK_LANES {
 class Tile {
 public:
     using Vector = Raw<8>::Signed;
+    using Unsigned = Raw<8>::Unsigned;
 
     static constexpr unsigned size = 8;
 
@@ -43,10 +44,10 @@ private:
     Vector itsVectors[size];
 };
 
-/// Eight of the caller's values, clipped to the input format; what was clipped leaves bits in `clipped`.
-/// Values beyond 16 bits, of which only the low 24 count (rule 4), are taken for clipped ones, too.
+/// Eight of the caller's values. Those beyond the input format, -128 to 127, leave bits in `beyond` above the low
+/// eight and come out as anything; values beyond 16 bits, of which only the low 24 count (rule 4), do so, too.
 template <class Input>
-MORVIK_INLINE Tile::Vector inputSteps(const Input* values, Tile::Vector& clipped)
+MORVIK_INLINE Tile::Vector inputSteps(const Input* values, Tile::Unsigned& beyond)
 {
     Tile::Vector words;
     if constexpr (sizeof(Input) == 4) {
@@ -66,23 +67,22 @@ MORVIK_INLINE Tile::Vector inputSteps(const Input* values, Tile::Vector& clipped
         std::memcpy(&bytes, values, sizeof bytes);
         return __builtin_convertvector(bytes, Tile::Vector);
     }
-    const auto kept = clip(Steps<8>{words}, -128, 127).v;
-    clipped |= kept ^ words;
-    return kept;
+    beyond |= reinterpret_cast<Tile::Unsigned>(words) + 128;
+    return words;
 }
 
 /// Fills rows of `lanes` values, a multiple of eight, from as many arrays of `steps` values each, eight or
 /// more. Returns whether all values were within the input format.
-template <class Input>
-bool loadRows(const Input* const* arrays, unsigned lanes, unsigned steps, std::int16_t* rows)
+template <unsigned lanes, class Input>
+bool loadRows(const Input* const* arrays, unsigned steps, std::int16_t* rows)
 {
-    Tile::Vector clipped{};
+    Tile::Unsigned beyond{};
     for (unsigned lane = 0; lane < lanes; lane += Tile::size) {
         for (unsigned next = 0; next < steps; next += Tile::size) {
             const unsigned k = next + Tile::size <= steps ? next : steps - Tile::size;
             Tile tile;
             for (unsigned i = 0; i < Tile::size; ++i) {
-                tile[i] = inputSteps(arrays[lane + i] + k, clipped);
+                tile[i] = inputSteps(arrays[lane + i] + k, beyond);
             }
             tile.transpose();
             for (unsigned i = 0; i < Tile::size; ++i) {
@@ -90,16 +90,16 @@ bool loadRows(const Input* const* arrays, unsigned lanes, unsigned steps, std::i
             }
         }
     }
-    std::int16_t any = 0;
+    unsigned any = 0;
     for (unsigned i = 0; i < Tile::size; ++i) {
-        any = static_cast<std::int16_t>(any | clipped[i]);
+        any |= beyond[i];
     }
-    return any == 0;
+    return any < 256;
 }
 
 /// Spreads rows of ratios over arrays, one for each lane: the aligned ratios, or the decisions they make.
-template <class Output>
-void storeRows(const std::int16_t* rows, unsigned lanes, unsigned steps, Output* const* arrays)
+template <unsigned lanes, class Output>
+void storeRows(const std::int16_t* rows, unsigned steps, Output* const* arrays)
 {
     for (unsigned lane = 0; lane < lanes; lane += Tile::size) {
         for (unsigned next = 0; next < steps; next += Tile::size) {
@@ -117,7 +117,7 @@ void storeRows(const std::int16_t* rows, unsigned lanes, unsigned steps, Output*
                     values = __builtin_convertvector((tile[i] >> 15) + 1, Outputs);
                 } else {
                     // A step is 16 in an aligned word, which wraps.
-                    values = reinterpret_cast<Outputs>(reinterpret_cast<Raw<Tile::size>::Unsigned>(tile[i]) << 4);
+                    values = reinterpret_cast<Outputs>(reinterpret_cast<Tile::Unsigned>(tile[i]) << 4);
                 }
                 std::memcpy(arrays[lane + i] + k, &values, sizeof values);
             }
