@@ -12,7 +12,6 @@ namespace lanes {
 
 namespace {
 
-constexpr unsigned mostLanes = 32;
 constexpr unsigned states = trellis::stateCount;
 
 /// Hands out arrays from a stretch of memory, or adds up their size when there is none yet. Each begins
@@ -105,6 +104,7 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
     layOut(kernel, work, static_cast<unsigned char*>(std::align(Layout::line, 1, base, space)));
     const LaneOrder order = laneOrder(kernel);
     for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
+        work.laneStart[lane] = {order.block(lane), order.segment(lane) * steps()};
         work.firstLanes[lane] = order.segment(lane) == 0 ? -1 : 0;
         work.lastLanes[lane] = order.segment(lane) == itsCut.segments - 1 ? -1 : 0;
     }
@@ -226,10 +226,10 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
                              unsigned s,
                              std::int16_t* rows)
 {
-    const LaneOrder order = laneOrder(*itsKernel);
     const Input* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
-        lanes[lane] = blocks[blockOf(lane)].*stream + order.segment(lane) * steps();
+        const LaneStart& start = itsCurrent->laneStart[lane];
+        lanes[lane] = blocks[presentBlock(start.block)].*stream + start.position;
     }
     bool within = loadRows(*itsKernel, lanes, steps(), rows);
     for (unsigned block = 0; block < itsBlocks; ++block) {
@@ -243,9 +243,9 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
 }
 
 /// Lanes without a block repeat the last one, so that their metrics stay within bounds, too.
-unsigned LaneDecoder::blockOf(unsigned lane) const
+unsigned LaneDecoder::presentBlock(unsigned block) const
 {
-    return std::min(lane / itsCut.segments, itsBlocks - 1);
+    return std::min(block, itsBlocks - 1);
 }
 
 void LaneDecoder::decode(unsigned halfIterations)
@@ -273,7 +273,7 @@ void LaneDecoder::prepareStarts(unsigned d)
     for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments; ++block) {
         const unsigned first = order.lane(block, 0);
         const unsigned last = order.lane(block, itsCut.segments - 1);
-        const std::array<int, 12>& t = itsTails[blockOf(first)];
+        const std::array<int, 12>& t = itsTails[presentBlock(block)];
         const unsigned o = 6 * d;
         const auto metrics =
             trellis::tailColumn<int>({{t[o], t[o + 2], t[o + 4]}, {t[o + 1], t[o + 3], t[o + 5]}, {0, 0, 0}});
@@ -290,11 +290,10 @@ void LaneDecoder::spread(void (*store)(const std::int16_t*, unsigned, Output* co
                          Output* const* blocks)
 {
     Output scratch[mostSteps];  // what the lanes without a block give
-    const LaneOrder order = laneOrder(*itsKernel);
     Output* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
-        const unsigned block = order.block(lane);
-        lanes[lane] = block < itsBlocks ? blocks[block] + order.segment(lane) * steps() : scratch;
+        const LaneStart& start = itsCurrent->laneStart[lane];
+        lanes[lane] = start.block < itsBlocks ? blocks[start.block] + start.position : scratch;
     }
     store(rows, steps(), lanes);
 }

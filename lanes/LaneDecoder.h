@@ -86,11 +86,19 @@ public:
 
 private:
     static constexpr unsigned mostSteps = 768;
+    static constexpr unsigned mostLanes = 32;
+
+    /// Which block a lane's segment belongs to, and the segment's first position there.
+    struct LaneStart {
+        unsigned block;
+        unsigned position;
+    };
 
     /// The working memory of one kernel, for one block size.
     struct Work {
         unsigned blockSize = 0;  ///< 0: none
         std::vector<unsigned char> storage;
+        LaneStart laneStart[mostLanes] = {};
         RowPermutations interleaver[2] = {};
         RowPermutations before = {};
         RowPermutations after = {};
@@ -101,7 +109,7 @@ private:
 
     unsigned steps() const;
     LaneOrder laneOrder(const Kernel& kernel) const;
-    unsigned blockOf(unsigned lane) const;
+    unsigned presentBlock(unsigned block) const;
     void prepareWork(const Kernel& kernel, Work& work) const;
     std::size_t layOut(const Kernel& kernel, Work& work, unsigned char* base) const;
     void prepareInterleaver(const Kernel& kernel, const RowPermutations& rows, const std::vector<unsigned>& from) const;

@@ -133,12 +133,12 @@ private:
     {
         Column b = load(itsRows.betaStart + window.r * states * row + window.v * count);
         if constexpr (overlapped) {
-            Column a = next.length() != 0 ? restoreForward(next.v) : Column{};
-            both<last>(window, b, next, a);
-            backward<last>(window, window.to - next.length(), b);
             if (next.length() != 0) {
+                Column a = restoreForward(next.v);
+                both<last>(window, b, next, a);
                 saveForward(next.v, broughtBack(a));
             }
+            backward<last>(window, window.to - next.length(), b);
         } else {
             backward<last>(window, window.to, b);
             if (next.length() != 0) {
