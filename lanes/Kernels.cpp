@@ -96,6 +96,7 @@ constexpr lanes::Kernel kernels[] = {
 #if defined(__AVX512BW__)
     Shape<16, 1>::kernel,
     Shape<32, 1>::kernel,
+    Shape<32, 2>::kernel,
 #elif defined(__AVX2__)
     Shape<16, 1>::kernel,
     Shape<16, 2>::kernel,

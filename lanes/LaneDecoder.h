@@ -86,7 +86,7 @@ public:
 
 private:
     static constexpr unsigned mostSteps = 768;
-    static constexpr unsigned mostLanes = 32;
+    static constexpr unsigned mostLanes = 64;
 
     /// Which block a lane's segment belongs to, and the segment's first position there.
     struct LaneStart {

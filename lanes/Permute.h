@@ -30,7 +30,6 @@ MORVIK_INLINE Steps<count> permuteWords(Steps<count> a, typename Steps<count>::V
 /// An index word for each lane.
 template <unsigned count, unsigned vectors>
 struct Permutation {
-    static_assert(vectors == 1);
     static constexpr unsigned group = count;
     static constexpr unsigned sources = 1;
     static constexpr unsigned bytes = 2 * count;
