@@ -7,7 +7,8 @@
 namespace MORVIK_LANES {
 namespace {
 
-template <unsigned count, unsigned vectors>
+/// Rows of `vectors` vectors; up to `mostAbreast` windows of one go abreast.
+template <unsigned count, unsigned vectors, unsigned mostAbreast = 1>
 struct Shape {
     static constexpr unsigned lanes = count * vectors;
     using LanesOfRow = Permutation<count, vectors>;
@@ -33,13 +34,25 @@ struct Shape {
     static void decode(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned halfIterations)
     {
         interleave(workspace);
+        // Where the first two windows are not equally long, none are but by chance.
+        const bool abreast = workspace.windows > 1 && workspace.windowStart[2] == 2 * workspace.windowStart[1];
+        if (mostAbreast > 1 && abreast) {
+            decodeAbreast<mostAbreast>(workspace, algorithm, halfIterations);
+        } else {
+            decodeAbreast<1>(workspace, algorithm, halfIterations);
+        }
+    }
+
+    template <unsigned abreast>
+    static void decodeAbreast(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned halfIterations)
+    {
         switch (algorithm) {
         case lanes::Algorithm::greatest:
-            return runPasses<Greatest<count>, false>(workspace, halfIterations);
+            return runPasses<Greatest, abreast, false>(workspace, halfIterations);
         case lanes::Algorithm::greatestScaled:
-            return runPasses<Greatest<count>, true>(workspace, halfIterations);
+            return runPasses<Greatest, abreast, true>(workspace, halfIterations);
         case lanes::Algorithm::corrected:
-            return runPasses<Corrected<count>, false>(workspace, halfIterations);
+            return runPasses<Corrected, abreast, false>(workspace, halfIterations);
         }
     }
 
@@ -56,24 +69,24 @@ struct Shape {
     }
 
     /// Even passes belong to decoder 1, odd ones to decoder 0 (rule 15). Pass 0 knows nothing beforehand.
-    template <class Rule, bool scaled>
+    template <template <unsigned> class RuleOf, unsigned abreast, bool scaled>
     static void runPasses(const lanes::Workspace& workspace, unsigned halfIterations)
     {
         const std::int16_t* joint = workspace.constituent[0].systematic;
         for (unsigned h = 0; h < halfIterations; ++h) {
             const unsigned d = h % 2 == 0 ? 1 : 0;
             if (h + 1 < halfIterations) {
-                runPass<Rule, vectors, scaled, false>(workspace, d, joint, h < 2);
+                runPass<RuleOf, count, vectors, abreast, scaled, false>(workspace, d, joint, h < 2);
             } else {
-                runPass<Rule, vectors, scaled, true>(workspace, d, joint, h < 2);
+                runPass<RuleOf, count, vectors, abreast, scaled, true>(workspace, d, joint, h < 2);
             }
             joint = workspace.constituent[d].joint;
         }
     }
 
-    static constexpr unsigned slotBytes = Pass<Greatest<count>, vectors, false>::slotBytes;
+    static constexpr unsigned slotBytes = Pass<Greatest, count, vectors, mostAbreast, false>::slotBytes;
     /// Of the rule that keeps more: what is pending with its values.
-    static constexpr unsigned forwardBytes = Pass<Corrected<count>, vectors, false>::forwardBytes;
+    static constexpr unsigned forwardBytes = Pass<Corrected, count, vectors, 1, false>::forwardBytes;
 
     static constexpr lanes::Kernel kernel = {lanes,
                                              count,
@@ -92,7 +105,11 @@ struct Shape {
 };
 
 constexpr lanes::Kernel kernels[] = {
+#if defined(__AVX2__)
+    Shape<8, 1, 2>::kernel,
+#else
     Shape<8, 1>::kernel,
+#endif
 #if defined(__AVX512BW__)
     Shape<16, 1>::kernel,
     Shape<32, 1>::kernel,

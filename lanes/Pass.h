@@ -13,26 +13,32 @@
 
 namespace MORVIK_LANES {
 
-/// A pass over rows of `vectors` vectors. The windows of a segment are worked on in turn, each of them in
-/// every lane: the forward recursion leaves its metrics in slots, one for each step; the backward recursion
-/// takes them up and goes on to ratios and joint values. `scaled` says whether extrinsic values are taken
-/// times 0.75.
-template <class Rule, unsigned vectors, bool scaled>
+/// A pass over rows of `vectors` vectors of `count` lanes. The windows of a segment are worked on in turn, each of
+/// them in every lane: the forward recursion leaves its metrics in slots, one for each step; the backward recursion
+/// takes them up and goes on to ratios and joint values. `scaled` says whether extrinsic values are taken times 0.75.
+///
+/// The backward recursion starts anew in each window, so that `abreast` windows of equal length can go side by
+/// side in one wider vector, where a vector of `count` lanes would leave a part of the machine idle.
+template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, bool scaled>
 class Pass {
-    static constexpr unsigned count = Rule::count;
     static constexpr unsigned states = trellis::stateCount;
     static constexpr unsigned row = vectors * count;
+    static constexpr unsigned wide = abreast * count;
     using Value = Steps<count>;
-    using BranchMetrics = StepsBranches<count>;
+    using WideValue = Steps<wide>;
     using Lanes = Permutation<count, vectors>;
+    using Rule = RuleOf<count>;
+    using WideRule = RuleOf<wide>;
     using Decision = typename Rule::Decision;
+    using WideDecision = typename WideRule::Decision;
     using Column = trellis::Column<Decision>;
+    using WideColumn = trellis::Column<WideDecision>;
 
     /// The metrics of a slot: eight forward metrics, two branch metrics (the others are their doubles: LTE
     /// has no second parity stream, rule 5) and the joint value.
-    static constexpr unsigned slotBranches = states * count;
-    static constexpr unsigned slotJoint = slotBranches + 2 * count;
-    static constexpr unsigned slotWords = slotJoint + count;
+    static constexpr unsigned slotBranches = states * wide;
+    static constexpr unsigned slotJoint = slotBranches + 2 * wide;
+    static constexpr unsigned slotWords = slotJoint + wide;
 
 public:
     /// What the workspace must have room for: a step of a window, and the forward recursion between two.
@@ -50,7 +56,8 @@ public:
           itsJoint(itsRows.joint),
           itsRatios(w.ratios),
           itsSlots(w.slots),
-          itsRule(workspace.corrections)
+          itsRule(workspace.corrections),
+          itsWideRule(workspace.corrections)
     {
     }
 
@@ -68,17 +75,15 @@ public:
         for (unsigned v = 0; v < vectors; ++v) {
             saveForward(v, load(itsRows.alphaStart + v * count));
         }
-        Window window = {0, 0, 0, w.windowStart[1], 0, slotWords};
-        runForward(window);
-        for (unsigned r = 0; r < w.windows; ++r) {
-            if (r == 2 && handedWithin) {
+        Windows windows = windowsFrom(0, 0, 0, slotWords);
+        runForward(windows);
+        while (windows.length != 0) {
+            if (windows.r[0] == 2 && windows.v == 0 && handedWithin) {
                 handBack();
             }
-            for (unsigned v = 0; v < vectors; ++v) {
-                const Window next = following(window);
-                runWindows<last>(window, next);
-                window = next;
-            }
+            const Windows next = following(windows);
+            runWindows<last>(windows, next);
+            windows = next;
         }
         for (unsigned v = 0; v < vectors; ++v) {
             storeBorder(restoreForward(v), itsRows.alphaReached + v * count);
@@ -86,159 +91,210 @@ public:
     }
 
 private:
-    /// A window of one vector's lanes. Its slots follow each other upwards and downwards in turn: the
-    /// forward recursion of a window fills the slots that the backward recursion of the one before frees.
-    struct Window {
-        unsigned r;
+    /// Windows of one vector's lanes that go abreast; the last ones are all the same one where no other is as
+    /// long. Their slots follow each other upwards and downwards in turn: the forward recursion of a window fills
+    /// the slots that the backward recursion of the one before frees.
+    struct Windows {
+        unsigned r[abreast];
         unsigned v;
-        unsigned from;  ///< first step
-        unsigned to;    ///< after the last step; `from` when there is no such window
+        unsigned length;  ///< 0 when there are no such windows
+        unsigned from[abreast];
         std::ptrdiff_t slot;
         std::ptrdiff_t direction;
 
-        MORVIK_INLINE unsigned length() const
-        {
-            return to - from;
-        }
-
         MORVIK_INLINE std::ptrdiff_t slotOf(unsigned step) const
         {
-            return slot + direction * (static_cast<std::ptrdiff_t>(step) - static_cast<std::ptrdiff_t>(from));
+            return slot + direction * static_cast<std::ptrdiff_t>(step);
         }
     };
 
-    /// The window after `window` in the order of work.
-    MORVIK_INLINE Window following(const Window& window) const
+    MORVIK_INLINE Windows windowsFrom(unsigned r, unsigned v, std::ptrdiff_t slot, std::ptrdiff_t direction) const
     {
-        const unsigned v = window.v + 1 == vectors ? 0 : window.v + 1;
-        const unsigned r = v == 0 ? window.r + 1 : window.r;
-        const std::ptrdiff_t slot = window.slotOf(window.to - 1);
-        if (r == w.windows) {
-            return {r, v, 0, 0, slot, -window.direction};
+        Windows windows = {{}, v, 0, {}, slot, direction};
+        windows.length = r == w.windows ? 0 : lengthOf(r);
+        for (unsigned j = 0; j < abreast; ++j) {
+            windows.r[j] = r;
+            windows.from[j] = w.windowStart[r];
+            if (r + 1 < w.windows && lengthOf(r + 1) == windows.length) {
+                ++r;
+            }
         }
-        return {r, v, w.windowStart[r], w.windowStart[r + 1], slot, -window.direction};
+        return windows;
     }
 
-    MORVIK_INLINE void runForward(const Window& window) const
+    MORVIK_INLINE unsigned lengthOf(unsigned r) const
     {
-        Column a = restoreForward(window.v);
-        forward(window, a);
-        saveForward(window.v, broughtBack(a));
+        return w.windowStart[r + 1] - w.windowStart[r];
     }
 
-    /// The backward recursion of a window, together with the forward recursion of the next one: two
+    /// The windows after these in the order of work.
+    MORVIK_INLINE Windows following(const Windows& windows) const
+    {
+        const std::ptrdiff_t slot = windows.slotOf(windows.length - 1);
+        if (windows.v + 1 < vectors) {
+            return windowsFrom(windows.r[0], windows.v + 1, slot, -windows.direction);
+        }
+        return windowsFrom(windows.r[abreast - 1] + 1, 0, slot, -windows.direction);
+    }
+
+    MORVIK_INLINE void runForward(const Windows& windows) const
+    {
+        const Column start = restoreForward(windows.v);
+        Column a = start;
+        for (unsigned j = 0; j < abreast; ++j) {
+            if (j > 0 && windows.r[j] == windows.r[j - 1]) {
+                a = start;
+            }
+            forward(windows, j, a);
+            a = broughtBack<Decision>(a);
+        }
+        saveForward(windows.v, a);
+    }
+
+    /// The backward recursion of windows, together with the forward recursion of the next ones: two
     /// independent chains keep the processor's units busy where its registers suffice for both.
     template <bool last>
-    MORVIK_INLINE void runWindows(const Window& window, const Window& next) const
+    MORVIK_INLINE void runWindows(const Windows& windows, const Windows& next) const
     {
-        Column b = load(itsRows.betaStart + window.r * states * row + window.v * count);
+        WideColumn b = loadStart(windows);
         if constexpr (overlapped) {
-            if (next.length() != 0) {
+            if (next.length != 0) {
                 Column a = restoreForward(next.v);
-                both<last>(window, b, next, a);
-                saveForward(next.v, broughtBack(a));
+                both<last>(windows, b, next, a);
+                saveForward(next.v, broughtBack<Decision>(a));
             }
-            backward<last>(window, window.to - next.length(), b);
+            backward<last>(windows, windows.length - next.length, b);
         } else {
-            backward<last>(window, window.to, b);
-            if (next.length() != 0) {
+            backward<last>(windows, windows.length, b);
+            if (next.length != 0) {
                 runForward(next);
             }
         }
-        storeReached(window, b);
+        storeReached(windows, b);
     }
 
 #if defined(__AVX512VL__) && defined(__x86_64__)
-    static constexpr bool overlapped = Rule::fewRegisters;
+    static constexpr bool overlapped = Rule::fewRegisters && abreast == 1;
 #else
     static constexpr bool overlapped = false;
 #endif
 
-    MORVIK_INLINE void forward(const Window& window, Column& a) const
+    MORVIK_INLINE void forward(const Windows& windows, unsigned j, Column& a) const
     {
-        std::int16_t* slot = itsSlots + window.slot;
-        for (unsigned k = window.from; k < window.to; ++k) {
-            forwardStep(k, window.v, slot, a);
-            slot += window.direction;
+        std::int16_t* slot = itsSlots + windows.slot + j * count;
+        for (unsigned i = 0; i < windows.length; ++i) {
+            forwardStep(at(windows, j, i), slot, a);
+            slot += windows.direction;
         }
     }
 
-    /// The steps of the window before `to`.
+    /// The first `steps` steps of the windows.
     template <bool last>
-    MORVIK_INLINE void backward(const Window& window, unsigned to, Column& b) const
+    MORVIK_INLINE void backward(const Windows& windows, unsigned steps, WideColumn& b) const
     {
-        const std::int16_t* slot = itsSlots + window.slotOf(to);
-        for (unsigned k = to; k-- > window.from;) {
-            slot -= window.direction;
-            backwardStep<last>(k, window.v, slot, b);
+        const std::int16_t* slot = itsSlots + windows.slotOf(steps);
+        for (unsigned i = steps; i-- > 0;) {
+            slot -= windows.direction;
+            backwardStep<last>(windows, i, slot, b);
         }
     }
 
-    /// As many backward steps of the window as the next one, which is no longer, has forward steps.
+    /// As many backward steps of the windows as the next one, which is no longer, has forward steps.
     template <bool last>
-    MORVIK_INLINE void both(const Window& window, Column& b, const Window& next, Column& a) const
+    MORVIK_INLINE void both(const Windows& windows, WideColumn& b, const Windows& next, Column& a) const
     {
-        const std::int16_t* slot = itsSlots + window.slotOf(window.to);
+        const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
         std::int16_t* nextSlot = itsSlots + next.slot;
-        for (unsigned i = 0; i < next.length(); ++i) {
-            slot -= window.direction;
-            backwardStep<last>(window.to - 1 - i, window.v, slot, b);
-            forwardStep(next.from + i, next.v, nextSlot, a);
+        for (unsigned i = 0; i < next.length; ++i) {
+            slot -= windows.direction;
+            backwardStep<last>(windows, windows.length - 1 - i, slot, b);
+            forwardStep(at(next, 0, i), nextSlot, a);
             nextSlot += next.direction;
         }
     }
 
-    MORVIK_INLINE void forwardStep(unsigned k, unsigned v, std::int16_t* slot, Column& a) const
+    /// Step `i` of all vectors' steps, into the window's lanes of a slot.
+    MORVIK_INLINE void forwardStep(unsigned i, std::int16_t* slot, Column& a) const
     {
-        const unsigned i = v * itsSteps + k;
         const std::uint32_t* const sources = itsInterleaver.sources + i * Lanes::sources;
         __builtin_prefetch(itsSource + sources[lanes::fetchAhead * Lanes::sources]);
         const Value joint = Lanes::load(itsSource, sources, itsInterleaver.controls + i * Lanes::bytes);
-        BranchMetrics g = trellis::branchSums(joint, Value::load(itsParity + at(k, v)), Value{});
+        StepsBranches<count> g = trellis::branchSums(joint, Value::load(itsParity + i * count), Value{});
         for (Value& metric : g) {
             metric = clip(metric, lanes::branchMin, lanes::branchMax);
         }
         trellis::forEach<states>([&](auto state)
-                                     MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * count); });
+                                     MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * wide); });
         g[0].store(slot + slotBranches);
-        g[1].store(slot + slotBranches + count);
+        g[1].store(slot + slotBranches + wide);
         joint.store(slot + slotJoint);
         a = trellis::forwardStep(itsRule.decision(), a, g);
     }
 
     template <bool last>
-    MORVIK_INLINE void backwardStep(unsigned k, unsigned v, const std::int16_t* slot, Column& b) const
+    MORVIK_INLINE void backwardStep(const Windows& windows, unsigned i, const std::int16_t* slot, WideColumn& b) const
     {
-        const Value g0 = Value::load(slot + slotBranches);
-        const Value g1 = Value::load(slot + slotBranches + count);
-        const BranchMetrics g = {g0, g1, g1, g0};
-        const Value ratio = itsRule.stepBack({slot}, b, g);
+        const WideValue g0 = WideValue::load(slot + slotBranches);
+        const WideValue g1 = WideValue::load(slot + slotBranches + wide);
+        const WideValue ratio = itsWideRule.stepBack({slot}, b, {g0, g1, g1, g0});
         if constexpr (last) {
-            ratio.store(itsRatios + at(k, v));
+            storeStep(windows, i, ratio, itsRatios);
         }
-        const Value joint = Value::load(slot + slotJoint);
-        nextJoint(ratio, joint, Value::load(itsSystematic + at(k, v))).store(itsJoint + at(k, v));
+        const WideValue joint = WideValue::load(slot + slotJoint);
+        storeStep(windows, i, nextJoint(ratio, joint, loadStep(windows, i, itsSystematic)), itsJoint);
     }
 
     /// The extrinsic value x = ratio - 2 joint is scaled, rounded down to a step and clipped (rule 14), and
     /// enters the other decoder halved, again rounded down (rule 13): all roundings fall into one.
-    static MORVIK_INLINE Value nextJoint(Value ratio, Value joint, Value systematic)
+    static MORVIK_INLINE WideValue nextJoint(WideValue ratio, WideValue joint, WideValue systematic)
     {
-        const Value x = ratio - (joint + joint);
-        const Value half = scaled ? threeEighths(x) : x >> 1;
+        const WideValue x = ratio - (joint + joint);
+        const WideValue half = scaled ? threeEighths(x) : x >> 1;
         return clip(half, lanes::branchMin / 2, lanes::branchMax / 2) + systematic;
     }
 
-    MORVIK_INLINE unsigned at(unsigned k, unsigned v) const
+    /// Step `i` of window `j` among the steps of all vectors.
+    MORVIK_INLINE unsigned at(const Windows& windows, unsigned j, unsigned i) const
     {
-        return (v * itsSteps + k) * count;
+        return windows.v * itsSteps + windows.from[j] + i;
     }
 
-    MORVIK_INLINE Column load(const std::int16_t* column) const
+    MORVIK_INLINE WideValue loadStep(const Windows& windows, unsigned i, const std::int16_t* rows) const
+    {
+        const Value first = Value::load(rows + at(windows, 0, i) * count);
+        if constexpr (abreast == 1) {
+            return first;
+        } else {
+            return join(first, Value::load(rows + at(windows, 1, i) * count));
+        }
+    }
+
+    MORVIK_INLINE void storeStep(const Windows& windows, unsigned i, WideValue value, std::int16_t* rows) const
+    {
+        trellis::forEach<abreast>(
+            [&](auto j) MORVIK_INLINE_LAMBDA { part<count, j>(value).store(rows + at(windows, j, i) * count); });
+    }
+
+    static MORVIK_INLINE Column load(const std::int16_t* column)
     {
         Column m{};
         trellis::forEach<states>(
             [&](auto state) MORVIK_INLINE_LAMBDA { m[state] = Decision::metric(Value::load(column + state * row)); });
+        return m;
+    }
+
+    MORVIK_INLINE WideColumn loadStart(const Windows& windows) const
+    {
+        WideColumn m{};
+        trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
+            const std::int16_t* const metrics = itsRows.betaStart + state * row + windows.v * count;
+            const Value first = Value::load(metrics + windows.r[0] * states * row);
+            if constexpr (abreast == 1) {
+                m[state] = WideDecision::metric(first);
+            } else {
+                m[state] = WideDecision::metric(join(first, Value::load(metrics + windows.r[1] * states * row)));
+            }
+        });
         return m;
     }
 
@@ -255,11 +311,13 @@ private:
     }
 
     /// A column with state 0 near 0, by a shift that border columns do not notice (Bounds.h).
-    static MORVIK_INLINE Column broughtBack(Column m)
+    template <class AnyDecision>
+    static MORVIK_INLINE trellis::Column<AnyDecision> broughtBack(trellis::Column<AnyDecision> m)
     {
-        const Value level = Decision::stored(m[0]) & Value::of(lanes::borderMask);
+        const auto level = AnyDecision::stored(m[0]);
+        const auto kept = level & level.of(lanes::borderMask);
         trellis::forEach<states>([&](auto state)
-                                     MORVIK_INLINE_LAMBDA { m[state] = Decision::subtract(m[state], level); });
+                                     MORVIK_INLINE_LAMBDA { m[state] = AnyDecision::subtract(m[state], kept); });
         return m;
     }
 
@@ -273,14 +331,18 @@ private:
 
     /// The column that a window reached is where the window before it starts next time; the first one's
     /// belongs to the segment before, to its last window.
-    MORVIK_INLINE void storeReached(const Window& window, const Column& b) const
+    MORVIK_INLINE void storeReached(const Windows& windows, const WideColumn& b) const
     {
-        const Column m = broughtBack(b);
-        if (window.r == 0) {
-            storeBorder(m, itsRows.betaReached + window.v * count);
-        } else {
-            storeBorder(m, itsRows.betaStart + (window.r - 1) * states * row + window.v * count);
-        }
+        const WideColumn m = broughtBack<WideDecision>(b);
+        trellis::forEach<abreast>([&](auto j) MORVIK_INLINE_LAMBDA {
+            const unsigned r = windows.r[j];
+            std::int16_t* const column = r == 0 ? itsRows.betaReached : itsRows.betaStart + (r - 1) * states * row;
+            Column reached{};
+            trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
+                reached[state] = Decision::metric(part<count, j>(WideDecision::stored(m[state])));
+            });
+            storeBorder(reached, column + windows.v * count);
+        });
     }
 
     MORVIK_INLINE void handBack() const
@@ -317,12 +379,13 @@ private:
     std::int16_t* const itsRatios;
     std::int16_t* const itsSlots;
     const Rule itsRule;
+    const WideRule itsWideRule;
 };
 
-template <class Rule, unsigned vectors, bool scaled, bool last>
+template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, bool scaled, bool last>
 MORVIK_INLINE_CALLS void runPass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint, bool first)
 {
-    Pass<Rule, vectors, scaled>(workspace, d, joint).template run<last>(first);
+    Pass<RuleOf, count, vectors, abreast, scaled>(workspace, d, joint).template run<last>(first);
 }
 
 }  // namespace MORVIK_LANES

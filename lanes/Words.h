@@ -118,6 +118,27 @@ struct Steps {
     }
 };
 
+/// The lanes of two vectors, side by side in one.
+template <unsigned count>
+MORVIK_INLINE Steps<2 * count> join(Steps<count> a, Steps<count> b)
+{
+    static_assert(count == 8);
+    return {__builtin_shufflevector(a.v, b.v, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15)};
+}
+
+/// Part `index` of a vector of which each has `count` lanes.
+template <unsigned count, unsigned index, unsigned wide>
+MORVIK_INLINE Steps<count> part(Steps<wide> a)
+{
+    if constexpr (count == wide) {
+        return a;
+    } else {
+        static_assert(count == 8);
+        constexpr int o = index * count;
+        return {__builtin_shufflevector(a.v, a.v, o, o + 1, o + 2, o + 3, o + 4, o + 5, o + 6, o + 7)};
+    }
+}
+
 /// floor(3 a / 8), for any a whose threefold fits 17 bits.
 template <unsigned count>
 MORVIK_INLINE Steps<count> threeEighths(Steps<count> a)
