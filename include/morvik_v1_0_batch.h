@@ -96,6 +96,53 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i8(veltra_ip_morvik_v1_0
                                                            const uint32_t* tags,
                                                            veltra_ip_morvik_v1_0_batch_outputs* outputs);
 
+/* Decodes `blocks` code blocks and counts the decisions that are wrong after each full iteration, for
+ * error-rate simulations. Decoding, refusals and warnings are those of the batch functions above.
+ *
+ * sent         the bits that were sent, K for each block, zero or not zero
+ * errors       out: [block][iteration], the wrong decisions of the block after that full iteration; the
+ *              last count of a block is that of its decisions with `iterations` iterations
+ * errors_alloc number of elements that `errors` has room for
+ *
+ * Status 1 also has these reasons:
+ *
+ *     ERROR:decoder:Simulate called with null pointer for sent
+ *     ERROR:decoder:Simulate called with null pointer for errors
+ *     ERROR:decoder:Insufficient allocated space for errors array
+ */
+MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i32(veltra_ip_morvik_v1_0_state* state,
+                                                                const int32_t* rsc1_sys,
+                                                                const int32_t* rsc1_par,
+                                                                const int32_t* rsc2_par,
+                                                                int32_t din_size,
+                                                                uint32_t blocks,
+                                                                uint32_t iterations,
+                                                                const uint8_t* sent,
+                                                                uint32_t* errors,
+                                                                size_t errors_alloc);
+
+MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i16(veltra_ip_morvik_v1_0_state* state,
+                                                                const int16_t* rsc1_sys,
+                                                                const int16_t* rsc1_par,
+                                                                const int16_t* rsc2_par,
+                                                                int32_t din_size,
+                                                                uint32_t blocks,
+                                                                uint32_t iterations,
+                                                                const uint8_t* sent,
+                                                                uint32_t* errors,
+                                                                size_t errors_alloc);
+
+MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i8(veltra_ip_morvik_v1_0_state* state,
+                                                               const int8_t* rsc1_sys,
+                                                               const int8_t* rsc1_par,
+                                                               const int8_t* rsc2_par,
+                                                               int32_t din_size,
+                                                               uint32_t blocks,
+                                                               uint32_t iterations,
+                                                               const uint8_t* sent,
+                                                               uint32_t* errors,
+                                                               size_t errors_alloc);
+
 /* How a state computes. A new state takes the best way that the machine has; all give the same bits.
  *
  *     avx512, avx2, ssse3    one lane for each segment of a block, on vectors of that instruction set

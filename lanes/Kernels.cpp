@@ -31,28 +31,30 @@ struct Shape {
         }
     }
 
-    static void decode(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned halfIterations)
+    static void decode(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned from, unsigned to)
     {
-        interleave(workspace);
+        if (from == 0) {
+            interleave(workspace);
+        }
         // Where the first two windows are not equally long, none are but by chance.
         const bool abreast = workspace.windows > 1 && workspace.windowStart[2] == 2 * workspace.windowStart[1];
         if (mostAbreast > 1 && abreast) {
-            decodeAbreast<mostAbreast>(workspace, algorithm, halfIterations);
+            decodeAbreast<mostAbreast>(workspace, algorithm, from, to);
         } else {
-            decodeAbreast<1>(workspace, algorithm, halfIterations);
+            decodeAbreast<1>(workspace, algorithm, from, to);
         }
     }
 
     template <unsigned abreast>
-    static void decodeAbreast(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned halfIterations)
+    static void decodeAbreast(const lanes::Workspace& workspace, lanes::Algorithm algorithm, unsigned from, unsigned to)
     {
         switch (algorithm) {
         case lanes::Algorithm::greatest:
-            return runPasses<Greatest, abreast, false>(workspace, halfIterations);
+            return runPasses<Greatest, abreast, false>(workspace, from, to);
         case lanes::Algorithm::greatestScaled:
-            return runPasses<Greatest, abreast, true>(workspace, halfIterations);
+            return runPasses<Greatest, abreast, true>(workspace, from, to);
         case lanes::Algorithm::corrected:
-            return runPasses<Corrected, abreast, false>(workspace, halfIterations);
+            return runPasses<Corrected, abreast, false>(workspace, from, to);
         }
     }
 
@@ -70,17 +72,17 @@ struct Shape {
 
     /// Even passes belong to decoder 1, odd ones to decoder 0 (rule 15). Pass 0 knows nothing beforehand.
     template <template <unsigned> class RuleOf, unsigned abreast, bool scaled>
-    static void runPasses(const lanes::Workspace& workspace, unsigned halfIterations)
+    static void runPasses(const lanes::Workspace& workspace, unsigned from, unsigned to)
     {
-        const std::int16_t* joint = workspace.constituent[0].systematic;
-        for (unsigned h = 0; h < halfIterations; ++h) {
+        for (unsigned h = from; h < to; ++h) {
             const unsigned d = h % 2 == 0 ? 1 : 0;
-            if (h + 1 < halfIterations) {
+            const lanes::ConstituentRows& other = workspace.constituent[1 - d];
+            const std::int16_t* joint = h == 0 ? other.systematic : other.joint;
+            if (h + 1 < to) {
                 runPass<RuleOf, count, vectors, abreast, scaled, false>(workspace, d, joint, h < 2);
             } else {
                 runPass<RuleOf, count, vectors, abreast, scaled, true>(workspace, d, joint, h < 2);
             }
-            joint = workspace.constituent[d].joint;
         }
     }
 

@@ -30,9 +30,9 @@ struct Kernel {
     bool (*loadHalfWords)(const std::int16_t* const* arrays, unsigned steps, std::int16_t* rows);
     bool (*loadBytes)(const std::int8_t* const* arrays, unsigned steps, std::int16_t* rows);
 
-    /// Runs passes 0 to halfIterations - 1. Systematic rows of decoder 0, parity rows and start columns
-    /// must be in place; leaves the ratios of the last pass, in its order.
-    void (*decode)(const Workspace& workspace, Algorithm algorithm, unsigned halfIterations);
+    /// Runs passes `from` to `to` - 1. Before pass 0, systematic rows of decoder 0, parity rows and start
+    /// columns must be in place; leaves the ratios of the last pass, in its order.
+    void (*decode)(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to);
 
     /// Spreads rows of ratios over one array for each lane, as decisions or as aligned ratios.
     void (*storeDecisions)(const std::int16_t* rows, unsigned steps, std::uint8_t* const* arrays);

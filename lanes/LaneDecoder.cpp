@@ -248,13 +248,14 @@ unsigned LaneDecoder::presentBlock(unsigned block) const
     return std::min(block, itsBlocks - 1);
 }
 
-void LaneDecoder::decode(unsigned halfIterations)
+void LaneDecoder::decode(unsigned from, unsigned to)
 {
-    for (const unsigned d : {0U, 1U}) {
-        prepareStarts(d);
+    if (from == 0) {
+        prepareStarts(0);
+        prepareStarts(1);
     }
-    itsKernel->decode(itsCurrent->space, itsAlgorithm, halfIterations);
-    itsLastDecoder = halfIterations % 2;
+    itsKernel->decode(itsCurrent->space, itsAlgorithm, from, to);
+    itsLastDecoder = to % 2;
 }
 
 /// Before the first passes the state is known at a block's ends alone (rules 10, 19, 20).

@@ -71,8 +71,9 @@ public:
     template <class Input>
     bool load(const Streams<Input>* blocks, unsigned count);
 
-    /// Runs passes 0 to halfIterations - 1, 1 or more, on the blocks that were loaded.
-    void decode(unsigned halfIterations);
+    /// Runs passes `from` to `to` - 1 on the blocks that were loaded: 0 is the first one, later ones go on where
+    /// the last call ended.
+    void decode(unsigned from, unsigned to);
 
     /// The results of the last pass, an array of K values for each block, in the order of the pass's
     /// constituent decoder: decisions, 0 or 1; ratios, aligned words; and what goes to the next pass, aligned

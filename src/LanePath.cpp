@@ -101,7 +101,12 @@ unsigned LanePath::blocksTaken(unsigned blocks) const
 
 void LanePath::decode(unsigned iterations)
 {
-    itsLanes->decode(2 * iterations);
+    itsLanes->decode(0, 2 * iterations);
+    count(iterations);
+}
+
+void LanePath::count(unsigned iterations)
+{
     itsIterations = iterations;
     itsDecoder.itsDecodeCount += itsLoaded;
     itsDecoder.itsHalfIterationCount += std::uint64_t{2} * iterations * itsLoaded;

@@ -38,6 +38,18 @@ public:
     }
 
     void decode(unsigned iterations);
+
+    /// Decodes likewise and calls afterEach(t) when results of full iteration t, from 0, are there.
+    template <class AfterEach>
+    void decode(unsigned iterations, AfterEach afterEach)
+    {
+        for (unsigned t = 0; t < iterations; ++t) {
+            itsLanes->decode(2 * t, 2 * t + 2);
+            afterEach(t);
+        }
+        count(iterations);
+    }
+
     void decisions(std::uint8_t* const* blocks);
     void ratios(std::int16_t* const* blocks);
 
@@ -52,6 +64,7 @@ private:
         unsigned iterations;
     };
 
+    void count(unsigned iterations);
     void keepLast();
 
     TDecoder3GPU& itsDecoder;

@@ -63,6 +63,26 @@ void convert(State& state, const lanes::Streams<Input>& block, std::int32_t dinS
     }
 }
 
+/// Calls decode(soft values) of a block for the components, and says how it ended.
+template <class Input, class Decode>
+Status withSoftValues(State& state, const lanes::Streams<Input>& streams, std::int32_t dinSize, Decode decode)
+{
+    std::vector<short> soft;
+    soft.reserve(3 * static_cast<std::size_t>(dinSize));
+    convert(state, streams, dinSize, [&](unsigned, std::int32_t, std::int32_t kept) {
+        soft.push_back(state.state_format->place(kept));
+    });
+    try {
+        if (state.lane_path != nullptr) {
+            state.lane_path->catchUp();
+        }
+        return decode(soft) ? success : decodeFailed;
+    } catch (...) {
+        refuse("Unhandled exception has occurred");
+        return exceptionRaised;
+    }
+}
+
 }  // namespace
 
 Status refuse(const char* reason)
@@ -90,20 +110,22 @@ Status decodeByComponents(State& state,
                           std::uint32_t iterations,
                           std::vector<unsigned char>& hard)
 {
-    std::vector<short> soft;
-    soft.reserve(3 * static_cast<std::size_t>(dinSize));
-    convert(state, streams, dinSize, [&](unsigned, std::int32_t, std::int32_t kept) {
-        soft.push_back(state.state_format->place(kept));
+    return withSoftValues(state, streams, dinSize, [&](const std::vector<short>& soft) {
+        return state.decoder->decode(soft, hard, iterations);
     });
-    try {
-        if (state.lane_path != nullptr) {
-            state.lane_path->catchUp();
-        }
-        return state.decoder->decode(soft, hard, iterations) ? success : decodeFailed;
-    } catch (...) {
-        refuse("Unhandled exception has occurred");
-        return exceptionRaised;
-    }
+}
+
+template <class Input>
+Status countByComponents(State& state,
+                         const lanes::Streams<Input>& streams,
+                         std::int32_t dinSize,
+                         const std::vector<unsigned char>& sent,
+                         std::vector<unsigned long long>& bitErrors)
+{
+    return withSoftValues(state, streams, dinSize, [&](const std::vector<short>& soft) {
+        std::vector<unsigned long long> blockErrors;
+        return state.decoder->decode(soft, sent, bitErrors, blockErrors);
+    });
 }
 
 bool lanesTake(const State& state, std::int32_t dinSize)
@@ -145,6 +167,21 @@ template Status decodeByComponents(
     State&, const lanes::Streams<std::int16_t>&, std::int32_t, std::uint32_t, std::vector<unsigned char>&);
 template Status decodeByComponents(
     State&, const lanes::Streams<std::int8_t>&, std::int32_t, std::uint32_t, std::vector<unsigned char>&);
+template Status countByComponents(State&,
+                                  const lanes::Streams<std::int32_t>&,
+                                  std::int32_t,
+                                  const std::vector<unsigned char>&,
+                                  std::vector<unsigned long long>&);
+template Status countByComponents(State&,
+                                  const lanes::Streams<std::int16_t>&,
+                                  std::int32_t,
+                                  const std::vector<unsigned char>&,
+                                  std::vector<unsigned long long>&);
+template Status countByComponents(State&,
+                                  const lanes::Streams<std::int8_t>&,
+                                  std::int32_t,
+                                  const std::vector<unsigned char>&,
+                                  std::vector<unsigned long long>&);
 template unsigned loadLanes(State&, const lanes::Streams<std::int32_t>*, unsigned, std::int32_t, const std::uint32_t*);
 template unsigned loadLanes(State&, const lanes::Streams<std::int16_t>*, unsigned, std::int32_t, const std::uint32_t*);
 template unsigned loadLanes(State&, const lanes::Streams<std::int8_t>*, unsigned, std::int32_t, const std::uint32_t*);

@@ -18,12 +18,10 @@ enum Status : std::int32_t { success = 0, refused = 1, decodeFailed = 2, excepti
 /// Writes the line of a refusal.
 Status refuse(const char* reason);
 
-/// What is wrong with the arguments of a call, or null. `delivers` is whether there is an output record,
-/// `dout` its array.
+/// What is wrong with the arguments of a call, or null; `outputFault` is what is wrong with where its results go.
 template <class Input>
 const char* checkArguments(const State* state,
-                           bool delivers,
-                           const std::uint8_t* dout,
+                           const char* outputFault,
                            const lanes::Streams<Input>& streams,
                            std::int32_t dinSize,
                            std::uint32_t iterations)
@@ -31,11 +29,8 @@ const char* checkArguments(const State* state,
     if (state == nullptr) {
         return "Simulate called with null state structure";
     }
-    if (!delivers) {
-        return "Simulate called with null output structure";
-    }
-    if (dout == nullptr) {
-        return "Simulate called with null pointer for dout";
+    if (outputFault != nullptr) {
+        return outputFault;
     }
     if (dinSize < 1) {
         return "din_size must be a positive integer";
@@ -55,6 +50,16 @@ const char* checkArguments(const State* state,
     return nullptr;
 }
 
+/// What is wrong with an output record of either header, or null.
+template <class Outputs>
+const char* outputFault(const Outputs* outputs)
+{
+    if (outputs == nullptr) {
+        return "Simulate called with null output structure";
+    }
+    return outputs->dout == nullptr ? "Simulate called with null pointer for dout" : nullptr;
+}
+
 /// The tag's bits that the core carries. The first tag of a state's life that loses bits is reported.
 std::uint32_t truncateTag(State& state, std::uint32_t tag);
 
@@ -66,6 +71,15 @@ Status decodeByComponents(State& state,
                           std::int32_t dinSize,
                           std::uint32_t iterations,
                           std::vector<unsigned char>& hard);
+
+/// The same, but adds up the decisions that differ from `sent` after each of as many full iterations as there
+/// are counts.
+template <class Input>
+Status countByComponents(State& state,
+                         const lanes::Streams<Input>& streams,
+                         std::int32_t dinSize,
+                         const std::vector<unsigned char>& sent,
+                         std::vector<unsigned long long>& bitErrors);
 
 /// K of a block of dinSize positions, which are as many as the tail has at least.
 inline unsigned blockSizeOf(std::int32_t dinSize)

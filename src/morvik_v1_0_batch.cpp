@@ -125,9 +125,8 @@ Status runByLanes(State& state, const Batch<Input>& batch, Outputs& outputs)
 template <class Input>
 std::int32_t simulate(State* state, const Batch<Input>& batch, Outputs* outputs)
 {
-    const std::uint8_t* dout = outputs == nullptr ? nullptr : outputs->dout;
-    const char* reason = checkArguments(state, outputs != nullptr, dout, batch.first, batch.dinSize, batch.iterations);
-    if (reason != nullptr) {
+    if (const char* reason =
+            checkArguments(state, outputFault(outputs), batch.first, batch.dinSize, batch.iterations)) {
         return refuse(reason);
     }
     if (batch.blocks == 0) {
@@ -135,6 +134,95 @@ std::int32_t simulate(State* state, const Batch<Input>& batch, Outputs* outputs)
     }
     return lanesTake(*state, batch.dinSize) ? runByLanes(*state, batch, *outputs)
                                             : runByComponents(*state, batch, *outputs);
+}
+
+/// What was sent, and where the counts of wrong decisions go.
+struct ErrorCount {
+    const std::uint8_t* sent;
+    std::uint32_t* errors;
+    std::size_t room;
+
+    /// What is wrong with it for so many blocks and iterations, or null.
+    const char* fault(std::uint32_t blocks, std::uint32_t iterations) const
+    {
+        if (sent == nullptr) {
+            return "Simulate called with null pointer for sent";
+        }
+        if (errors == nullptr) {
+            return "Simulate called with null pointer for errors";
+        }
+        return room / std::max(iterations, 1U) < blocks ? "Insufficient allocated space for errors array" : nullptr;
+    }
+};
+
+template <class Input>
+Status countAllByComponents(State& state, const Batch<Input>& batch, const ErrorCount& count)
+{
+    const std::size_t K = batch.dinSize < std::int32_t{lanes::tailPositions} ? 0 : blockSizeOf(batch.dinSize);
+    for (std::size_t b = 0; b < batch.blocks; ++b) {
+        const std::vector<unsigned char> sent(count.sent + b * K, count.sent + (b + 1) * K);
+        std::vector<unsigned long long> bitErrors(batch.iterations);
+        const Status status = countByComponents(state, batch.block(b), batch.dinSize, sent, bitErrors);
+        if (status != success) {
+            return status;
+        }
+        std::transform(bitErrors.begin(), bitErrors.end(), count.errors + b * batch.iterations, [](auto errors) {
+            return static_cast<std::uint32_t>(errors);
+        });
+    }
+    return success;
+}
+
+std::uint32_t differences(const std::uint8_t* decisions, const std::uint8_t* sent, std::size_t K)
+{
+    std::uint32_t differing = 0;
+    for (std::size_t i = 0; i < K; ++i) {
+        differing += decisions[i] != (sent[i] != 0) ? 1U : 0U;
+    }
+    return differing;
+}
+
+template <class Input>
+Status countAllByLanes(State& state, const Batch<Input>& batch, const ErrorCount& count)
+{
+    const std::size_t K = blockSizeOf(batch.dinSize);
+    LanePath& path = *state.lane_path;
+    std::vector<lanes::Streams<Input>> blocks;
+    for (std::size_t b = 0; b < batch.blocks; ++b) {
+        blocks.push_back(batch.block(b));
+    }
+    std::vector<std::uint8_t> bits;
+    std::vector<std::uint8_t*> decisions;
+    for (std::size_t b = 0; b < batch.blocks; b += decisions.size()) {
+        const unsigned taken =
+            loadLanes(state, &blocks[b], static_cast<unsigned>(batch.blocks - b), batch.dinSize, nullptr);
+        bits.resize(taken * K);
+        decisions.resize(taken);
+        for (std::size_t i = 0; i < taken; ++i) {
+            decisions[i] = &bits[i * K];
+        }
+        path.decode(batch.iterations, [&](unsigned t) {
+            path.decisions(decisions.data());
+            for (std::size_t i = 0; i < taken; ++i) {
+                count.errors[(b + i) * batch.iterations + t] = differences(decisions[i], count.sent + (b + i) * K, K);
+            }
+        });
+    }
+    return success;
+}
+
+template <class Input>
+std::int32_t countErrors(State* state, const Batch<Input>& batch, const ErrorCount& count)
+{
+    const char* const fault = count.fault(batch.blocks, batch.iterations);
+    if (const char* reason = checkArguments(state, fault, batch.first, batch.dinSize, batch.iterations)) {
+        return refuse(reason);
+    }
+    if (batch.blocks == 0) {
+        return success;
+    }
+    return lanesTake(*state, batch.dinSize) ? countAllByLanes(*state, batch, count)
+                                            : countAllByComponents(*state, batch, count);
 }
 
 }  // namespace
@@ -176,6 +264,51 @@ int32_t veltra_ip_morvik_v1_0_batch_simulate_i8(veltra_ip_morvik_v1_0_state* sta
                                                 veltra_ip_morvik_v1_0_batch_outputs* outputs)
 {
     return simulate<std::int8_t>(state, {{rsc1_sys, rsc1_par, rsc2_par}, din_size, blocks, iterations, tags}, outputs);
+}
+
+int32_t veltra_ip_morvik_v1_0_batch_count_errors_i32(veltra_ip_morvik_v1_0_state* state,
+                                                     const int32_t* rsc1_sys,
+                                                     const int32_t* rsc1_par,
+                                                     const int32_t* rsc2_par,
+                                                     int32_t din_size,
+                                                     uint32_t blocks,
+                                                     uint32_t iterations,
+                                                     const uint8_t* sent,
+                                                     uint32_t* errors,
+                                                     size_t errors_alloc)
+{
+    return countErrors<std::int32_t>(
+        state, {{rsc1_sys, rsc1_par, rsc2_par}, din_size, blocks, iterations, nullptr}, {sent, errors, errors_alloc});
+}
+
+int32_t veltra_ip_morvik_v1_0_batch_count_errors_i16(veltra_ip_morvik_v1_0_state* state,
+                                                     const int16_t* rsc1_sys,
+                                                     const int16_t* rsc1_par,
+                                                     const int16_t* rsc2_par,
+                                                     int32_t din_size,
+                                                     uint32_t blocks,
+                                                     uint32_t iterations,
+                                                     const uint8_t* sent,
+                                                     uint32_t* errors,
+                                                     size_t errors_alloc)
+{
+    return countErrors<std::int16_t>(
+        state, {{rsc1_sys, rsc1_par, rsc2_par}, din_size, blocks, iterations, nullptr}, {sent, errors, errors_alloc});
+}
+
+int32_t veltra_ip_morvik_v1_0_batch_count_errors_i8(veltra_ip_morvik_v1_0_state* state,
+                                                    const int8_t* rsc1_sys,
+                                                    const int8_t* rsc1_par,
+                                                    const int8_t* rsc2_par,
+                                                    int32_t din_size,
+                                                    uint32_t blocks,
+                                                    uint32_t iterations,
+                                                    const uint8_t* sent,
+                                                    uint32_t* errors,
+                                                    size_t errors_alloc)
+{
+    return countErrors<std::int8_t>(
+        state, {{rsc1_sys, rsc1_par, rsc2_par}, din_size, blocks, iterations, nullptr}, {sent, errors, errors_alloc});
 }
 
 int32_t veltra_ip_morvik_v1_0_set_instruction_set(veltra_ip_morvik_v1_0_state* state, const char* name)

@@ -190,8 +190,7 @@ int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state
                                               veltra_ip_morvik_v1_0_outputs* outputs)
 {
     const lanes::Streams<std::int32_t> streams = {rsc1_sys, rsc1_par, rsc2_par};
-    const std::uint8_t* dout = outputs == nullptr ? nullptr : outputs->dout;
-    if (const char* reason = checkArguments(state, outputs != nullptr, dout, streams, din_size, iterations)) {
+    if (const char* reason = checkArguments(state, outputFault(outputs), streams, din_size, iterations)) {
         return refuse(reason);
     }
     const bool byLanes = lanesTake(*state, din_size);

@@ -113,7 +113,7 @@ std::vector<Results> laneResults(LaneDecoder& decoder, const std::vector<blocks:
         const auto rest = static_cast<unsigned>(blocks.size() - first);
         const unsigned taken = decoder.blocksTaken(rest);
         EXPECT_TRUE(decoder.load(&streams[first], rest));
-        decoder.decode(passes);
+        decoder.decode(0, passes);
         std::vector<std::uint8_t*> decisions;
         std::vector<std::int16_t*> ratios;
         std::vector<std::int16_t*> joint;

@@ -75,6 +75,22 @@ Batch<Input>::Batch(const std::vector<Block>& blocks)
 }
 
 template <class Input>
+std::int32_t Batch<Input>::countErrors(
+    State* state, unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors, std::size_t room) const
+{
+    const auto call = [&](auto function) {
+        return function(state, sys.data(), par1.data(), par2.data(), dinSize, count, iterations, sent, errors, room);
+    };
+    if constexpr (sizeof(Input) == 4) {
+        return call(veltra_ip_morvik_v1_0_batch_count_errors_i32);
+    } else if constexpr (sizeof(Input) == 2) {
+        return call(veltra_ip_morvik_v1_0_batch_count_errors_i16);
+    } else {
+        return call(veltra_ip_morvik_v1_0_batch_count_errors_i8);
+    }
+}
+
+template <class Input>
 Block Batch<Input>::block(std::size_t b) const
 {
     const auto size = static_cast<std::size_t>(dinSize);

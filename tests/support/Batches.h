@@ -36,6 +36,10 @@ struct Batch {
     Block block(std::size_t b) const;
 
     std::int32_t simulate(State* state, unsigned iterations, const std::uint32_t* tags, BatchOutputs* outputs) const;
+
+    /// `room` is what the errors are said to have room for.
+    std::int32_t countErrors(
+        State* state, unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors, std::size_t room) const;
 };
 
 /// The function for a type of soft values.
