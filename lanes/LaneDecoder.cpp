@@ -160,9 +160,8 @@ void LaneDecoder::prepareInterleaver(const Kernel& kernel,
             return (from[k + segment * steps()] - sourceRow) / steps();
         });
     }
-    std::fill_n(rows.sources + rows.count * (kernel.lanes / kernel.vectorLanes) * kernel.sources,
-                fetchAhead * kernel.sources,
-                0U);
+    const std::size_t vectors = kernel.lanes / kernel.vectorLanes;
+    std::fill_n(rows.sources + rows.count * vectors * kernel.sources, fetchAhead * kernel.sources, 0U);
 }
 
 /// Row `row` takes its values from row `sourceRow`, each segment from segment sourceOf(segment), modulo the

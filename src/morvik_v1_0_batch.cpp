@@ -177,7 +177,7 @@ std::uint32_t differences(const std::uint8_t* decisions, const std::uint8_t* sen
 {
     std::uint32_t differing = 0;
     for (std::size_t i = 0; i < K; ++i) {
-        differing += decisions[i] != (sent[i] != 0) ? 1U : 0U;
+        differing += (decisions[i] != 0) != (sent[i] != 0) ? 1U : 0U;
     }
     return differing;
 }
