@@ -2,6 +2,8 @@
 #ifndef MORVIK_LANES_LANEORDER_H
 #define MORVIK_LANES_LANEORDER_H
 
+#include <algorithm>
+
 namespace lanes {
 
 /// Blocks of `segments` segments, a power of two, share the vectors of a row, whose lanes form groups of
@@ -16,8 +18,8 @@ public:
     LaneOrder(unsigned segments, unsigned groupLanes, unsigned vectorLanes)
         : itsSegments(segments),
           itsGroupLanes(groupLanes),
-          itsGroups(segments > groupLanes ? segments / groupLanes : 1),
-          itsVectors(segments > vectorLanes ? segments / vectorLanes : 1)
+          itsGroups(std::max(segments / groupLanes, 1U)),
+          itsVectors(std::max(segments / vectorLanes, 1U))
     {
     }
 
