@@ -1,0 +1,38 @@
+// AliasTable: draws one of 256 values in one step, each with its exact probability (the method of Walker and Vose).
+#include "AliasTable.h"
+
+#include <vector>
+
+namespace morvik::link {
+
+/// Every entry has room for 2^40. A value with less weight than that leaves the rest to one with more, its alias.
+AliasTable::AliasTable(const Weights& weights)
+{
+    constexpr std::uint64_t room = std::uint64_t{1} << 40;
+    static_assert(room * size == std::uint64_t{1} << weightBits);
+
+    Weights left = weights;
+    std::vector<unsigned> poor;
+    std::vector<unsigned> rich;
+    for (unsigned value = 0; value < size; ++value) {
+        alias[value] = static_cast<std::uint8_t>(value);
+        (left[value] < room ? poor : rich).push_back(value);
+    }
+    // The sums are exact: while there is a poor entry there is a rich one, and those that stay full are their own
+    // alias, so that their threshold of 0 does no harm.
+    while (!poor.empty()) {
+        const unsigned taker = poor.back();
+        const unsigned giver = rich.back();
+        poor.pop_back();
+        highThreshold[taker] = static_cast<std::uint8_t>(left[taker] >> 32);
+        lowThreshold[taker] = static_cast<std::uint32_t>(left[taker] & 0xFFFFFFFF);
+        alias[taker] = static_cast<std::uint8_t>(giver);
+        left[giver] -= room - left[taker];
+        if (left[giver] < room) {
+            rich.pop_back();
+            poor.push_back(giver);
+        }
+    }
+}
+
+}  // namespace morvik::link

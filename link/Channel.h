@@ -1,0 +1,49 @@
+// Channel: BPSK over additive white Gaussian noise, and the quantiser behind it.
+//
+// A bit 1 is sent as +1 and a bit 0 as -1. A soft value is what is received times a scale, rounded and clipped to
+// -128 ... 127.
+#ifndef MORVIK_LINK_CHANNEL_H
+#define MORVIK_LINK_CHANNEL_H
+
+#include <array>
+#include <cstdint>
+
+#include "AliasTable.h"
+
+namespace morvik::link {
+
+/// The noise's standard deviation for an Eb/N0 that counts the tail's energy: the rate is K / (3 K + 12).
+long double noiseDeviation(unsigned K, int milliDecibels);
+
+/// How the rounded value r of a bit that was sent as 1 is distributed. That of a 0 is -r.
+struct RoundedDistribution {
+    /// Probabilities of r times 2^48, by the value's byte (r modulo 256): the end -128 has all that is below as well,
+    /// 127 all that is above. The sum is exact.
+    AliasTable::Weights weights;
+
+    /// Of a uniform 32-bit number that divides the ends up: it is below `top`[0] when r is 127 rather than more, and
+    /// below `top`[1] when r is 128 or less rather than more; below `bottom` when r is -128 rather than less.
+    std::array<std::uint64_t, 2> top;
+    std::uint64_t bottom;
+};
+
+/// `scale` above 0.
+RoundedDistribution roundedDistribution(long double deviation, long double scale);
+
+/// A soft value, and whether it was clipped.
+struct SoftValue {
+    std::int8_t value;
+    bool clipped;
+
+    static SoftValue of(int rounded)
+    {
+        if (rounded < -128) {
+            return {-128, true};
+        }
+        return rounded > 127 ? SoftValue{127, true} : SoftValue{static_cast<std::int8_t>(rounded), false};
+    }
+};
+
+}  // namespace morvik::link
+
+#endif

@@ -1,0 +1,73 @@
+// FrameSource: frames as a decoder receives them: random bits, encoded, sent over BPSK with Gaussian noise, quantised.
+#ifndef MORVIK_LINK_FRAMESOURCE_H
+#define MORVIK_LINK_FRAMESOURCE_H
+
+#include <array>
+#include <cstdint>
+#include <vector>
+
+#include "Random.h"
+#include "SamplerForm.h"
+#include "SoftValueSampler.h"
+#include "TurboEncoder.h"
+
+namespace morvik::link {
+
+/// Some frames, one after the other.
+struct Frames {
+    std::vector<std::uint8_t> sent;                   ///< K bits of each frame, each 0 or 1
+    std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic, parity 1, parity 2: K + 4 soft values of each
+                                                      ///< frame, as include/morvik_v1_0_batch.h takes them
+    std::vector<std::uint32_t> clipped;               ///< how many soft values of each frame were clipped
+};
+
+/// How soft values are made.
+enum class Noise {
+    discrete,  ///< drawn from the exact distribution of the quantised values; the same on every machine
+    gaussian,  ///< a Gaussian number added, then quantised: slow, and as exact as the mathematical library of the
+               ///< machine; a check of the other
+};
+
+/// Makes the frames of one point. A frame is determined by seed, K, Eb/N0, scale and its number. Its information bits
+/// do not depend on the scale.
+class FrameSource {
+public:
+    /// K                one of the 188 block sizes
+    /// milliDecibels    Eb/N0 in thousandths of a decibel, from -262144 to 262143
+    /// scale            steps of the soft values for amplitude 1, above 0
+    ///
+    /// Throws std::invalid_argument for any other. `form` is there for tests.
+    FrameSource(unsigned K,
+                int milliDecibels,
+                double scale,
+                std::uint64_t seed,
+                Noise noise = Noise::discrete,
+                const SamplerForm& form = samplerForms().front());
+
+    /// Makes frames first to first + count - 1. Any cut of a range gives the same frames; multiples of 64 cost least.
+    void make(std::uint64_t first, unsigned count, Frames& frames);
+
+private:
+    void encode(std::uint64_t first, unsigned count);
+    void receive(std::uint64_t first, unsigned count, std::size_t place, Frames& frames);
+    std::uint32_t addNoise(const FrameKey& frame,
+                           std::uint32_t firstValue,
+                           const std::uint64_t* bits,
+                           std::int8_t* values) const;
+    FrameKey key(std::uint64_t frame) const;
+
+    unsigned itsK;
+    int itsMilliDecibels;
+    double itsScale;
+    std::uint64_t itsSeed;
+    Noise itsNoise;
+    double itsDeviation;
+    TurboEncoder itsEncoder;
+    SoftValueSampler itsSampler;
+    PackedBlocks itsInformation;
+    TurboEncoder::Streams itsStreams;
+};
+
+}  // namespace morvik::link
+
+#endif

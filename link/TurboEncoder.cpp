@@ -1,0 +1,137 @@
+// TurboEncoder: the turbo encoder of 3GPP TS 36.212, clause 5.1.3.2, for up to 64 blocks at once.
+#include "TurboEncoder.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <string>
+
+#include "../standard/BlockSizes.h"
+#include "BitMatrix.h"
+
+namespace morvik::link {
+
+namespace {
+
+constexpr unsigned tailPositions = 4;
+
+/// Position i of the second encoder's order is position [i] of the first one's.
+std::vector<std::uint16_t> permutation(unsigned K)
+{
+    const standard::BlockSize* const row = standard::findBlockSize(K);
+    if (row == nullptr) {
+        throw std::invalid_argument(std::to_string(K) + " is no block size of the LTE turbo code");
+    }
+    std::vector<std::uint16_t> positions;
+    positions.reserve(K);
+    for (std::uint64_t i = 0; i < K; ++i) {
+        positions.push_back(static_cast<std::uint16_t>((row->f1 * i + row->f2 * i * i) % K));
+    }
+    return positions;
+}
+
+/// A constituent encoder of 64 blocks: feedback 1 + D^2 + D^3, parity 1 + D + D^3.
+class ConstituentEncoder {
+public:
+    /// Takes a bit of each block and returns the parity bits.
+    std::uint64_t step(std::uint64_t bits)
+    {
+        const std::uint64_t fed = bits ^ itsMiddle ^ itsOldest;
+        const std::uint64_t parity = fed ^ itsNewest ^ itsOldest;
+        itsOldest = itsMiddle;
+        itsMiddle = itsNewest;
+        itsNewest = fed;
+        return parity;
+    }
+
+    /// The bits that feed zeros, so that three steps end in state 0.
+    std::uint64_t terminating() const
+    {
+        return itsMiddle ^ itsOldest;
+    }
+
+private:
+    std::uint64_t itsNewest = 0;
+    std::uint64_t itsMiddle = 0;
+    std::uint64_t itsOldest = 0;
+};
+
+/// The three systematic and parity bits that end a trellis, in the order they are sent.
+std::array<std::uint64_t, 6> terminate(ConstituentEncoder& encoder)
+{
+    std::array<std::uint64_t, 6> tail{};
+    for (unsigned i = 0; i < tail.size(); i += 2) {
+        tail[i] = encoder.terminating();
+        tail[i + 1] = encoder.step(tail[i]);
+    }
+    return tail;
+}
+
+}  // namespace
+
+TurboEncoder::TurboEncoder(unsigned K)
+    : itsK(K), itsWords((K + tailPositions + 63) / 64), itsPermutation(permutation(K))
+{
+    for (Slices& slices : itsSlices) {
+        slices.resize(std::size_t{64} * itsWords);
+    }
+}
+
+void TurboEncoder::encode(const PackedBlocks& information, unsigned count, Streams& streams)
+{
+    for (unsigned word = 0; word < itsWords; ++word) {
+        gather(information, count, word, &itsSlices[0][std::size_t{64} * word]);
+    }
+    encodeSlices();
+    for (unsigned s = 0; s < streams.size(); ++s) {
+        streams[s].words = itsWords;
+        streams[s].bits.resize(std::size_t{count} * itsWords);
+        for (unsigned word = 0; word < itsWords; ++word) {
+            scatter(&itsSlices[s][std::size_t{64} * word], count, word, streams[s]);
+        }
+    }
+}
+
+void TurboEncoder::encodeSlices()
+{
+    auto& [systematic, parity1, parity2] = itsSlices;
+    ConstituentEncoder first;
+    ConstituentEncoder second;
+    for (unsigned k = 0; k < itsK; ++k) {
+        parity1[k] = first.step(systematic[k]);
+        parity2[k] = second.step(systematic[itsPermutation[k]]);
+    }
+    // The tail goes over the three streams position by position, the first encoder's before the second's.
+    unsigned position = itsK;
+    for (ConstituentEncoder* const encoder : {&first, &second}) {
+        const std::array<std::uint64_t, 6> tail = terminate(*encoder);
+        for (unsigned i = 0; i < tail.size(); i += 3, ++position) {
+            systematic[position] = tail[i];
+            parity1[position] = tail[i + 1];
+            parity2[position] = tail[i + 2];
+        }
+    }
+}
+
+/// Turns a word of each block into 64 slices.
+void TurboEncoder::gather(const PackedBlocks& blocks, unsigned count, unsigned word, std::uint64_t* slices) const
+{
+    BitMatrix matrix{};
+    for (unsigned b = 0; b < count; ++b) {
+        matrix[b] = blocks.block(b)[word];
+    }
+    transpose(matrix);
+    std::copy(matrix.begin(), matrix.end(), slices);
+}
+
+/// Turns 64 slices into a word of each block.
+void TurboEncoder::scatter(const std::uint64_t* slices, unsigned count, unsigned word, PackedBlocks& blocks) const
+{
+    BitMatrix matrix;
+    std::copy_n(slices, matrix.size(), matrix.begin());
+    transpose(matrix);
+    for (unsigned b = 0; b < count; ++b) {
+        blocks.block(b)[word] = matrix[b];
+    }
+}
+
+}  // namespace morvik::link

@@ -1,0 +1,64 @@
+// TurboEncoder: the turbo encoder of 3GPP TS 36.212, clause 5.1.3.2, for up to 64 blocks at once.
+#ifndef MORVIK_LINK_TURBOENCODER_H
+#define MORVIK_LINK_TURBOENCODER_H
+
+#include <array>
+#include <cstdint>
+#include <vector>
+
+namespace morvik::link {
+
+/// Blocks of bits, one after the other, each in `words` words: bit i of a block is bit i % 64 of its word i / 64.
+struct PackedBlocks {
+    unsigned words = 0;
+    std::vector<std::uint64_t> bits;
+
+    std::uint64_t* block(unsigned b)
+    {
+        return &bits[b * words];
+    }
+
+    const std::uint64_t* block(unsigned b) const
+    {
+        return &bits[b * words];
+    }
+};
+
+class TurboEncoder {
+public:
+    /// How many blocks one call encodes at most. It takes about as long for one.
+    static constexpr unsigned blocksAtOnce = 64;
+
+    /// The three streams: systematic, first and second parity. K + 4 bits of each block, its twelve tail bits last, in
+    /// the order of include/morvik_v1_0_bitacc_cmodel.h.
+    using Streams = std::array<PackedBlocks, 3>;
+
+    /// Throws std::invalid_argument when K is no block size.
+    explicit TurboEncoder(unsigned K);
+
+    /// Words of a packed block, with its tail or without.
+    unsigned words() const
+    {
+        return itsWords;
+    }
+
+    /// Encodes `count` blocks, up to blocksAtOnce. Bits of `information` behind a block's K have to be 0, as are those
+    /// of the streams behind K + 4.
+    void encode(const PackedBlocks& information, unsigned count, Streams& streams);
+
+private:
+    using Slices = std::vector<std::uint64_t>;  ///< one word for each position: its bits of all blocks
+
+    void encodeSlices();
+    void gather(const PackedBlocks& blocks, unsigned count, unsigned word, std::uint64_t* slices) const;
+    void scatter(const std::uint64_t* slices, unsigned count, unsigned word, PackedBlocks& blocks) const;
+
+    unsigned itsK;
+    unsigned itsWords;
+    std::vector<std::uint16_t> itsPermutation;
+    std::array<Slices, 3> itsSlices;
+};
+
+}  // namespace morvik::link
+
+#endif
