@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 #include <stdexcept>
 #include <string>
 
@@ -32,24 +33,15 @@ double checkedScale(double scale)
     return scale;
 }
 
-/// Sets the information bits of a packed block.
-void drawInformation(const FrameKey& frame, unsigned K, std::uint64_t* block)
-{
-    for (unsigned k = 0; k < K; k += 128) {
-        const RandomBlock random = randomBlock(frame, random_index::information + k / 128);
-        for (unsigned half = 0; half < 2 && k + 64 * half < K; ++half) {
-            const unsigned used = std::min(64U, K - k - 64 * half);
-            const std::uint64_t word = std::uint64_t{random[2 * half + 1]} << 32 | random[2 * half];
-            block[k / 64 + half] = word & ~std::uint64_t{0} >> (64 - used);
-        }
-    }
-}
-
 /// Spreads packed bits over bytes of 0 and 1.
 void unpack(const std::uint64_t* block, unsigned K, std::uint8_t* bits)
 {
-    for (unsigned k = 0; k < K; ++k) {
-        bits[k] = static_cast<std::uint8_t>(block[k / 64] >> k % 64 & 1);
+    constexpr std::uint64_t everyByte = 0x0101010101010101;
+    for (unsigned k = 0; k < K; k += 8) {
+        // Byte j keeps bit j of the eight; adding 127 moves it to the highest place, whichever it was.
+        const std::uint64_t eight = (block[k / 64] >> k % 64 & 0xFF) * everyByte & 0x8040201008040201;
+        const std::uint64_t bytes = (eight + 0x7F * everyByte) >> 7 & everyByte;
+        std::memcpy(bits + k, &bytes, sizeof bytes);
     }
 }
 
@@ -60,11 +52,12 @@ FrameSource::FrameSource(
     : itsK(K),
       itsMilliDecibels(checkedMilliDecibels(milliDecibels)),
       itsScale(checkedScale(scale)),
-      itsSeed(seed),
+      itsKey(randomKey(seed)),
       itsNoise(noise),
       itsDeviation(static_cast<double>(noiseDeviation(K, milliDecibels))),
       itsEncoder(K),
-      itsSampler(roundedDistribution(noiseDeviation(K, milliDecibels), scale), form)
+      itsSampler(roundedDistribution(noiseDeviation(K, milliDecibels), scale), itsKey, form),
+      itsRandomBits(itsKey, form)
 {
     itsInformation.words = itsEncoder.words();
     itsInformation.bits.resize(std::size_t{TurboEncoder::blocksAtOnce} * itsInformation.words);
@@ -79,58 +72,82 @@ void FrameSource::make(std::uint64_t first, unsigned count, Frames& frames)
     frames.clipped.resize(count);
     for (unsigned done = 0; done < count; done += TurboEncoder::blocksAtOnce) {
         const unsigned now = std::min(count - done, TurboEncoder::blocksAtOnce);
-        encode(first + done, now);
+        drawInformation(first + done, now);
+        itsEncoder.encode(itsInformation, now, itsStreams);
         receive(first + done, now, done, frames);
     }
 }
 
-void FrameSource::encode(std::uint64_t first, unsigned count)
+void FrameSource::drawInformation(std::uint64_t first, unsigned count)
 {
+    const unsigned randomBlocks = (itsK + 127) / 128;
+    itsRandomBits.clear();
     for (unsigned i = 0; i < count; ++i) {
-        drawInformation(key(first + i), itsK, itsInformation.block(i));
+        const FrameRandom random = randomOf(first + i);
+        for (unsigned b = 0; b < randomBlocks; ++b) {
+            itsRandomBits.put(random.counterLow(random_index::information + b), random.counterHigh());
+        }
     }
-    itsEncoder.encode(itsInformation, count, itsStreams);
+    itsRandomBits.draw();
+    for (unsigned i = 0; i < count; ++i) {
+        for (unsigned k = 0; k < itsK; k += 64) {
+            const std::size_t b = std::size_t{i} * randomBlocks + k / 128;
+            const std::uint64_t word = k % 128 == 0 ? itsRandomBits.low(b) : itsRandomBits.high(b);
+            itsInformation.block(i)[k / 64] = word & ~std::uint64_t{0} >> (64 - std::min(64U, itsK - k));
+        }
+    }
 }
 
 /// Makes frames of the encoded blocks, from place `place` on.
 void FrameSource::receive(std::uint64_t first, unsigned count, std::size_t place, Frames& frames)
 {
     for (unsigned i = 0; i < count; ++i) {
-        const std::size_t to = place + i;
-        unpack(itsInformation.block(i), itsK, &frames.sent[to * itsK]);
-        const FrameKey frame = key(first + i);
-        frames.clipped[to] = 0;
-        for (std::uint32_t s = 0; s < itsStreams.size(); ++s) {
-            const std::uint64_t* const bits = itsStreams[s].block(i);
-            std::int8_t* const values = &frames.streams[s][to * (itsK + 4)];
-            const std::uint32_t firstValue = s * streamStride;
-            frames.clipped[to] += itsNoise == Noise::discrete
-                                      ? itsSampler.draw(frame, firstValue, bits, itsK + 4, values)
-                                      : addNoise(frame, firstValue, bits, values);
+        unpack(itsInformation.block(i), itsK, &frames.sent[(place + i) * itsK]);
+        frames.clipped[place + i] = 0;
+        if (itsNoise == Noise::discrete) {
+            receiveDiscrete(randomOf(first + i), i, place + i, frames);
+        } else {
+            receiveGaussian(randomOf(first + i), i, place + i, frames);
+        }
+    }
+    itsSampler.draw();
+}
+
+void FrameSource::receiveDiscrete(const FrameRandom& random, unsigned frame, std::size_t place, Frames& frames)
+{
+    for (std::uint32_t s = 0; s < itsStreams.size(); ++s) {
+        itsSampler.put(random,
+                       s * streamStride,
+                       itsStreams[s].block(frame),
+                       itsK + 4,
+                       &frames.streams[s][place * (itsK + 4)],
+                       frames.clipped[place]);
+    }
+    // As many as the caches hold well.
+    if (itsSampler.size() >= 256) {
+        itsSampler.draw();
+    }
+}
+
+void FrameSource::receiveGaussian(const FrameRandom& random, unsigned frame, std::size_t place, Frames& frames) const
+{
+    for (std::uint32_t s = 0; s < itsStreams.size(); ++s) {
+        const std::uint64_t* const bits = itsStreams[s].block(frame);
+        std::int8_t* const values = &frames.streams[s][place * (itsK + 4)];
+        for (unsigned i = 0; i < itsK + 4; ++i) {
+            const double noise = gaussianNumber(random.block(random_index::gaussian + s * streamStride + i));
+            const double sent = (bits[i / 64] >> i % 64 & 1) != 0 ? 1 : -1;
+            const double rounded = std::round(itsScale * (sent + itsDeviation * noise));
+            const SoftValue soft = SoftValue::of(static_cast<int>(std::clamp(rounded, -129.0, 128.0)));
+            values[i] = soft.value;
+            frames.clipped[place] += soft.clipped ? 1 : 0;
         }
     }
 }
 
-std::uint32_t FrameSource::addNoise(const FrameKey& frame,
-                                    std::uint32_t firstValue,
-                                    const std::uint64_t* bits,
-                                    std::int8_t* values) const
+FrameRandom FrameSource::randomOf(std::uint64_t frame) const
 {
-    std::uint32_t clipped = 0;
-    for (unsigned i = 0; i < itsK + 4; ++i) {
-        const double noise = gaussianNumber(randomBlock(frame, random_index::gaussian + firstValue + i));
-        const double received = ((bits[i / 64] >> i % 64 & 1) != 0 ? 1 : -1) + itsDeviation * noise;
-        const double rounded = std::round(itsScale * received);
-        const SoftValue soft = SoftValue::of(static_cast<int>(std::clamp(rounded, -129.0, 128.0)));
-        values[i] = soft.value;
-        clipped += soft.clipped ? 1 : 0;
-    }
-    return clipped;
-}
-
-FrameKey FrameSource::key(std::uint64_t frame) const
-{
-    return frameKey(itsSeed, itsK, itsMilliDecibels, frame);
+    return {itsKey, itsK, itsMilliDecibels, frame};
 }
 
 }  // namespace morvik::link

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "Random.h"
+#include "RandomBatch.h"
 #include "SamplerForm.h"
 #include "SoftValueSampler.h"
 #include "TurboEncoder.h"
@@ -48,22 +49,21 @@ public:
     void make(std::uint64_t first, unsigned count, Frames& frames);
 
 private:
-    void encode(std::uint64_t first, unsigned count);
+    void drawInformation(std::uint64_t first, unsigned count);
     void receive(std::uint64_t first, unsigned count, std::size_t place, Frames& frames);
-    std::uint32_t addNoise(const FrameKey& frame,
-                           std::uint32_t firstValue,
-                           const std::uint64_t* bits,
-                           std::int8_t* values) const;
-    FrameKey key(std::uint64_t frame) const;
+    void receiveDiscrete(const FrameRandom& random, unsigned frame, std::size_t place, Frames& frames);
+    void receiveGaussian(const FrameRandom& random, unsigned frame, std::size_t place, Frames& frames) const;
+    FrameRandom randomOf(std::uint64_t frame) const;
 
     unsigned itsK;
     int itsMilliDecibels;
     double itsScale;
-    std::uint64_t itsSeed;
+    RandomKey itsKey;
     Noise itsNoise;
     double itsDeviation;
     TurboEncoder itsEncoder;
     SoftValueSampler itsSampler;
+    RandomBatch itsRandomBits;
     PackedBlocks itsInformation;
     TurboEncoder::Streams itsStreams;
 };

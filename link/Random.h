@@ -5,24 +5,58 @@
 #ifndef MORVIK_LINK_RANDOM_H
 #define MORVIK_LINK_RANDOM_H
 
+#include <Random123/philox.h>
+
 #include <array>
 #include <cstdint>
 
 namespace morvik::link {
 
+using RandomKey = std::array<std::uint32_t, 2>;
+
 /// 128 random bits; word 0 holds the lowest.
 using RandomBlock = std::array<std::uint32_t, 4>;
 
-/// What names a frame: the generator's key, and its counter but for the index, which is the counter's first word.
-struct FrameKey {
-    std::array<std::uint32_t, 2> key;
-    std::array<std::uint32_t, 3> counter;
+/// The random block of a counter: of its words 0 and 1, word 0 lowest, and of its words 2 and 3.
+inline RandomBlock randomBlock(const RandomKey& key, std::uint64_t counterLow, std::uint64_t counterHigh)
+{
+    const auto low = [](std::uint64_t words) {
+        return static_cast<std::uint32_t>(words & 0xFFFFFFFF);
+    };
+    const philox4x32_ctr_t counter = {
+        {low(counterLow), low(counterLow >> 32), low(counterHigh), low(counterHigh >> 32)}};
+    const philox4x32_ctr_t words = philox4x32(counter, (philox4x32_key_t{{key[0], key[1]}}));
+    return {words.v[0], words.v[1], words.v[2], words.v[3]};
+}
+
+RandomKey randomKey(std::uint64_t seed);
+
+/// The random numbers of a frame. Word 0 of the counter is the index, the others name the frame and its point.
+class FrameRandom {
+public:
+    /// `K` below 8192; `milliDecibels`, the Eb/N0 in thousandths of a decibel, from -262144 to 262143.
+    FrameRandom(const RandomKey& key, unsigned K, int milliDecibels, std::uint64_t frame);
+
+    RandomBlock block(std::uint32_t index) const
+    {
+        return randomBlock(itsKey, counterLow(index), itsHigh);
+    }
+
+    std::uint64_t counterLow(std::uint32_t index) const
+    {
+        return itsLow | index;
+    }
+
+    std::uint64_t counterHigh() const
+    {
+        return itsHigh;
+    }
+
+private:
+    RandomKey itsKey;
+    std::uint64_t itsLow;
+    std::uint64_t itsHigh;
 };
-
-/// `K` below 8192; `milliDecibels`, the Eb/N0 in thousandths of a decibel, from -262144 to 262143.
-FrameKey frameKey(std::uint64_t seed, unsigned K, int milliDecibels, std::uint64_t frame);
-
-RandomBlock randomBlock(const FrameKey& frame, std::uint32_t index);
 
 /// Where the indices of a frame's numbers begin, by what they are for.
 namespace random_index {

@@ -1,39 +1,66 @@
-// SamplerForm: the ways to draw quantised values for 64 bits at a time, one for each instruction set that has its own.
+// SamplerForm: the ways to draw quantised values, one for each instruction set that has its own.
 #include "SamplerForm.h"
 
 #include <algorithm>
+#include <array>
+#include <cstring>
+
+#include "SamplerFormX86.h"
 
 namespace morvik::link {
 
 namespace {
 
-unsigned byteOf(const RandomBlock& block, unsigned i)
+/// Bits of a group's masks, of eight values.
+struct Left8 {
+    unsigned undecided = 0;
+    unsigned ends = 0;
+};
+
+/// Draws the eight values of a random block; the definition of what the other forms do.
+Left8 drawBlock(const AliasTable& table, const RandomBlock& random, unsigned bits, std::int8_t* values)
 {
-    return block[i / 4] >> 8 * (i % 4) & 0xFF;
+    Left8 left;
+    for (unsigned i = 0; i < 8; ++i) {
+        const unsigned entry = random[i / 4] >> 8 * (i % 4) & 0xFF;
+        const unsigned fraction = random[2 + i / 4] >> 8 * (i % 4) & 0xFF;
+        const unsigned threshold = table.highThreshold[entry];
+        const unsigned value = fraction <= threshold ? entry : table.alias[entry];
+        left.undecided |= (fraction == threshold ? 1U : 0U) << i;
+        left.ends |= (value == 127 || value == 128 ? 1U : 0U) << i;
+        values[i] = static_cast<std::int8_t>((bits >> i & 1) != 0 ? value : 0 - value);
+    }
+    return left;
 }
 
-void drawGeneric(const Draws& draws)
+void drawGroup(const AliasTable& table, const RandomKey& key, ValueGroup& group)
 {
-    const AliasTable& table = *draws.table;
-    for (unsigned first = 0; first < draws.count; first += 64) {
-        std::uint64_t undecided = 0;
-        std::uint64_t ends = 0;
-        const unsigned last = std::min(first + 64, draws.count);
-        for (unsigned i = first; i < last; i += 8) {
-            const RandomBlock random = randomBlock(*draws.frame, draws.index + i / 8);
-            for (unsigned j = 0; j < 8 && i + j < last; ++j) {
-                const unsigned entry = byteOf(random, j);
-                const unsigned fraction = byteOf(random, 8 + j);
-                const unsigned value = fraction <= table.highThreshold[entry] ? entry : table.alias[entry];
-                const std::uint64_t place = std::uint64_t{1} << (i + j - first);
-                undecided |= fraction == table.highThreshold[entry] ? place : 0;
-                ends |= value == 127 || value == 128 ? place : 0;
-                const bool bit = (draws.bits[first / 64] & place) != 0;
-                draws.values[i + j] = static_cast<std::int8_t>(bit ? value : 0 - value);
-            }
-        }
-        draws.undecided[first / 64] = undecided;
-        draws.ends[first / 64] = ends;
+    group.undecided = 0;
+    group.ends = 0;
+    for (unsigned i = 0; i < group.count; i += 8) {
+        std::array<std::int8_t, 8> values;
+        const RandomBlock random = randomBlock(key, group.counterLow + i / 8, group.counterHigh);
+        const Left8 left = drawBlock(table, random, group.bits >> i & 0xFF, values.data());
+        const unsigned used = std::min(8U, group.count - i);
+        std::memcpy(group.values + i, values.data(), used);
+        group.undecided |= std::uint64_t{left.undecided & ((1U << used) - 1)} << i;
+        group.ends |= std::uint64_t{left.ends & ((1U << used) - 1)} << i;
+    }
+}
+
+void drawGeneric(const AliasTable& table, const RandomKey& key, ValueGroup* groups, std::size_t count)
+{
+    for (std::size_t g = 0; g < count; ++g) {
+        drawGroup(table, key, groups[g]);
+    }
+}
+
+void randomBlocksGeneric(const RandomKey& key, std::uint64_t* low, std::uint64_t* high, std::size_t count)
+{
+    for (std::size_t i = 0; i < count; ++i) {
+        const RandomBlock block = randomBlock(key, low[i], high[i]);
+        low[i] = std::uint64_t{block[1]} << 32 | block[0];
+        high[i] = std::uint64_t{block[3]} << 32 | block[2];
     }
 }
 
@@ -41,7 +68,19 @@ void drawGeneric(const Draws& draws)
 
 std::vector<SamplerForm> samplerForms()
 {
-    return {{"generic", drawGeneric}};
+    std::vector<SamplerForm> forms;
+#if defined(MORVIK_LINK_X86)
+    __builtin_cpu_init();
+    if (__builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
+        __builtin_cpu_supports("avx512vbmi")) {
+        forms.push_back({"avx512", drawAvx512, randomBlocksAvx512});
+    }
+    if (__builtin_cpu_supports("avx2")) {
+        forms.push_back({"avx2", drawAvx2, randomBlocksAvx2});
+    }
+#endif
+    forms.push_back({"generic", drawGeneric, randomBlocksGeneric});
+    return forms;
 }
 
 }  // namespace morvik::link

@@ -4,83 +4,114 @@
 // equal the threshold's, its word 0 goes on; at the ends of the range, its word 1 tells how far beyond.
 #include "SoftValueSampler.h"
 
-#include <cstddef>
+#include <algorithm>
 
 namespace morvik::link {
 
 namespace {
 
-/// Calls `visit` with the number of each bit that is set, 64 bits to a word.
-template <class Visit>
-void forEachBit(const std::vector<std::uint64_t>& words, Visit visit)
+/// The value of a 1 or of a 0, from that of the other or of itself, as a byte.
+std::uint8_t turned(int value, bool bit)
 {
-    for (std::size_t w = 0; w < words.size(); ++w) {
-        for (std::uint64_t left = words[w]; left != 0; left &= left - 1) {
-            visit(static_cast<unsigned>(64 * w) + static_cast<unsigned>(__builtin_ctzll(left)));
-        }
-    }
-}
-
-bool bitOf(const std::uint64_t* words, unsigned i)
-{
-    return (words[i / 64] >> i % 64 & 1) != 0;
+    return static_cast<std::uint8_t>(bit ? value : -value);
 }
 
 }  // namespace
 
-SoftValueSampler::SoftValueSampler(const RoundedDistribution& distribution, const SamplerForm& form)
-    : itsTable(distribution.weights), itsDistribution(distribution), itsForm(form)
+SoftValueSampler::SoftValueSampler(const RoundedDistribution& distribution,
+                                   const RandomKey& key,
+                                   const SamplerForm& form)
+    : itsTable(distribution.weights),
+      itsDistribution(distribution),
+      itsKey(key),
+      itsForm(form),
+      itsRefinements(key, form)
 {
 }
 
-std::uint32_t SoftValueSampler::draw(
-    const FrameKey& frame, std::uint32_t first, const std::uint64_t* bits, unsigned count, std::int8_t* values)
+void SoftValueSampler::put(const FrameRandom& random,
+                           std::uint32_t number,
+                           const std::uint64_t* bits,
+                           unsigned count,
+                           std::int8_t* values,
+                           std::uint32_t& clipped)
 {
-    itsUndecided.resize((count + 63) / 64);
-    itsEnds.resize(itsUndecided.size());
-    itsForm.draw({&itsTable,
-                  &frame,
-                  random_index::softValues + first / 8,
-                  count,
-                  bits,
-                  values,
-                  itsUndecided.data(),
-                  itsEnds.data()});
-
-    const auto refinement = [&](unsigned i) {
-        return randomBlock(frame, random_index::refinements + first + i);
-    };
-    const auto signedAs = [&](unsigned i, int value) {
-        return static_cast<std::uint8_t>(bitOf(bits, i) ? value : -value);
-    };
-    forEachBit(itsUndecided, [&](unsigned i) {
-        const std::uint8_t entry = signedAs(i, values[i]);
-        const bool own = refinement(i)[0] < itsTable.lowThreshold[entry];
-        const std::uint8_t value = own ? entry : itsTable.alias[entry];
-        values[i] = static_cast<std::int8_t>(signedAs(i, value));
-        const std::uint64_t place = std::uint64_t{1} << i % 64;
-        const bool end = value == 127 || value == 128;
-        itsEnds[i / 64] = (itsEnds[i / 64] & ~place) | (end ? place : 0);
-    });
-    std::uint32_t clipped = 0;
-    forEachBit(itsEnds, [&](unsigned i) {
-        const SoftValue soft = atEnd(signedAs(i, values[i]) == 127, bitOf(bits, i), refinement(i)[1]);
-        values[i] = soft.value;
-        clipped += soft.clipped ? 1 : 0;
-    });
-    return clipped;
+    const std::size_t groups = itsGroupCount + (count + 63) / 64;
+    if (groups > itsGroups.size()) {
+        itsGroups.resize(2 * groups);
+    }
+    for (unsigned first = 0; first < count; first += 64) {
+        ValueGroup& group = itsGroups[itsGroupCount++];
+        group.counterLow = random.counterLow(random_index::softValues + (number + first) / 8);
+        group.counterHigh = random.counterHigh();
+        group.bits = bits[first / 64];
+        group.values = values + first;
+        group.count = std::min(64U, count - first);
+        group.clipped = &clipped;
+    }
 }
 
-/// One of the range's ends, as the random number divides it up.
-SoftValue SoftValueSampler::atEnd(bool top, bool bit, std::uint32_t random) const
+void SoftValueSampler::draw()
 {
+    itsForm.draw(itsTable, itsKey, itsGroups.data(), itsGroupCount);
+    collect(&ValueGroup::undecided);
+    for (std::size_t i = 0; i < itsOpen.size(); ++i) {
+        decide(itsOpen[i], static_cast<std::uint32_t>(itsRefinements.low(i) & 0xFFFFFFFF));
+    }
+    collect(&ValueGroup::ends);
+    for (std::size_t i = 0; i < itsOpen.size(); ++i) {
+        divideEnd(itsOpen[i], static_cast<std::uint32_t>(itsRefinements.low(i) >> 32));
+    }
+    itsGroupCount = 0;
+}
+
+/// Makes the marked values the open ones, and draws their random blocks.
+void SoftValueSampler::collect(std::uint64_t ValueGroup::*marks)
+{
+    itsOpen.clear();
+    for (std::size_t g = 0; g < itsGroupCount; ++g) {
+        for (std::uint64_t left = itsGroups[g].*marks; left != 0; left &= left - 1) {
+            itsOpen.push_back(static_cast<OpenValue>(64 * g) + static_cast<unsigned>(__builtin_ctzll(left)));
+        }
+    }
+    itsRefinements.clear();
+    for (const OpenValue open : itsOpen) {
+        const ValueGroup& group = itsGroups[open / 64];
+        const std::uint64_t firstValue = 8 * ((group.counterLow & 0xFFFFFFFF) - random_index::softValues);
+        const std::uint64_t index = random_index::refinements + firstValue + open % 64;
+        itsRefinements.put(group.counterLow >> 32 << 32 | index, group.counterHigh);
+    }
+    itsRefinements.draw();
+}
+
+/// A value whose 8 bits equal the threshold's.
+void SoftValueSampler::decide(OpenValue open, std::uint32_t random)
+{
+    ValueGroup& group = itsGroups[open / 64];
+    const unsigned i = open % 64;
+    const std::uint64_t place = std::uint64_t{1} << i;
+    const bool bit = (group.bits & place) != 0;
+    const std::uint8_t entry = turned(group.values[i], bit);
+    const std::uint8_t value = random < itsTable.lowThreshold[entry] ? entry : itsTable.alias[entry];
+    group.values[i] = static_cast<std::int8_t>(turned(value, bit));
+    group.ends = (group.ends & ~place) | (value == 127 || value == 128 ? place : 0);
+}
+
+/// A value at one of the range's ends.
+void SoftValueSampler::divideEnd(OpenValue open, std::uint32_t random)
+{
+    const ValueGroup& group = itsGroups[open / 64];
+    const unsigned i = open % 64;
+    const bool bit = (group.bits >> i & 1) != 0;
     int rounded = 0;
-    if (top) {
+    if (turned(group.values[i], bit) == 127) {
         rounded = random < itsDistribution.top[0] ? 127 : random < itsDistribution.top[1] ? 128 : 129;
     } else {
         rounded = random < itsDistribution.bottom ? -128 : -129;
     }
-    return SoftValue::of(bit ? rounded : -rounded);
+    const SoftValue soft = SoftValue::of(bit ? rounded : -rounded);
+    group.values[i] = soft.value;
+    *group.clipped += soft.clipped ? 1 : 0;
 }
 
 }  // namespace morvik::link

@@ -2,33 +2,57 @@
 #ifndef MORVIK_LINK_SOFTVALUESAMPLER_H
 #define MORVIK_LINK_SOFTVALUESAMPLER_H
 
+#include <cstddef>
 #include <cstdint>
 #include <vector>
 
 #include "AliasTable.h"
 #include "Channel.h"
 #include "Random.h"
+#include "RandomBatch.h"
 #include "SamplerForm.h"
 
 namespace morvik::link {
 
+/// Use: put up the values that are wanted, of any frames, then draw them all at once.
 class SoftValueSampler {
 public:
-    SoftValueSampler(const RoundedDistribution& distribution, const SamplerForm& form);
+    SoftValueSampler(const RoundedDistribution& distribution, const RandomKey& key, const SamplerForm& form);
 
-    /// Draws the values of a frame's `count` bits, 64 to a word, of which the first is number `first` of the frame, a
-    /// multiple of 8. Returns how many were clipped.
-    std::uint32_t draw(
-        const FrameKey& frame, std::uint32_t first, const std::uint64_t* bits, unsigned count, std::int8_t* values);
+    /// Puts up the values of `count` bits of a frame, 64 to a word. `number` is the first one's number within the
+    /// frame, a multiple of 8. Those that are clipped will be counted in `clipped`.
+    void put(const FrameRandom& random,
+             std::uint32_t number,
+             const std::uint64_t* bits,
+             unsigned count,
+             std::int8_t* values,
+             std::uint32_t& clipped);
+
+    /// How many groups of values are put up.
+    std::size_t size() const
+    {
+        return itsGroupCount;
+    }
+
+    /// Draws all values that were put up.
+    void draw();
 
 private:
-    SoftValue atEnd(bool top, bool bit, std::uint32_t random) const;
+    /// A value that needs its own random block: number i of group g is 64 g + i.
+    using OpenValue = std::uint32_t;
+
+    void collect(std::uint64_t ValueGroup::*marks);
+    void decide(OpenValue open, std::uint32_t random);
+    void divideEnd(OpenValue open, std::uint32_t random);
 
     AliasTable itsTable;
     RoundedDistribution itsDistribution;
+    RandomKey itsKey;
     SamplerForm itsForm;
-    std::vector<std::uint64_t> itsUndecided;
-    std::vector<std::uint64_t> itsEnds;
+    std::vector<ValueGroup> itsGroups;
+    std::size_t itsGroupCount = 0;  ///< of itsGroups that are put up
+    std::vector<OpenValue> itsOpen;
+    RandomBatch itsRefinements;
 };
 
 }  // namespace morvik::link

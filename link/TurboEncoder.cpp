@@ -79,15 +79,19 @@ TurboEncoder::TurboEncoder(unsigned K)
 void TurboEncoder::encode(const PackedBlocks& information, unsigned count, Streams& streams)
 {
     for (unsigned word = 0; word < itsWords; ++word) {
-        gather(information, count, word, &itsSlices[0][std::size_t{64} * word]);
+        gather(information, word, count);
     }
     encodeSlices();
     for (unsigned s = 0; s < streams.size(); ++s) {
         streams[s].words = itsWords;
         streams[s].bits.resize(std::size_t{count} * itsWords);
-        for (unsigned word = 0; word < itsWords; ++word) {
-            scatter(&itsSlices[s][std::size_t{64} * word], count, word, streams[s]);
-        }
+    }
+    // The systematic stream is the information but for its last word, which has the tail.
+    std::copy_n(information.bits.begin(), streams[0].bits.size(), streams[0].bits.begin());
+    scatter(0, itsWords - 1, count, streams[0]);
+    for (unsigned word = 0; word < itsWords; ++word) {
+        scatter(1, word, count, streams[1]);
+        scatter(2, word, count, streams[2]);
     }
 }
 
@@ -112,22 +116,22 @@ void TurboEncoder::encodeSlices()
     }
 }
 
-/// Turns a word of each block into 64 slices.
-void TurboEncoder::gather(const PackedBlocks& blocks, unsigned count, unsigned word, std::uint64_t* slices) const
+/// Turns a word of each block into 64 slices of the systematic stream.
+void TurboEncoder::gather(const PackedBlocks& information, unsigned word, unsigned count)
 {
     BitMatrix matrix{};
     for (unsigned b = 0; b < count; ++b) {
-        matrix[b] = blocks.block(b)[word];
+        matrix[b] = information.block(b)[word];
     }
     transpose(matrix);
-    std::copy(matrix.begin(), matrix.end(), slices);
+    std::copy(matrix.begin(), matrix.end(), &itsSlices[0][std::size_t{64} * word]);
 }
 
-/// Turns 64 slices into a word of each block.
-void TurboEncoder::scatter(const std::uint64_t* slices, unsigned count, unsigned word, PackedBlocks& blocks) const
+/// Turns 64 slices of a stream into a word of each block.
+void TurboEncoder::scatter(unsigned stream, unsigned word, unsigned count, PackedBlocks& blocks) const
 {
     BitMatrix matrix;
-    std::copy_n(slices, matrix.size(), matrix.begin());
+    std::copy_n(&itsSlices[stream][std::size_t{64} * word], matrix.size(), matrix.begin());
     transpose(matrix);
     for (unsigned b = 0; b < count; ++b) {
         blocks.block(b)[word] = matrix[b];

@@ -50,8 +50,8 @@ private:
     using Slices = std::vector<std::uint64_t>;  ///< one word for each position: its bits of all blocks
 
     void encodeSlices();
-    void gather(const PackedBlocks& blocks, unsigned count, unsigned word, std::uint64_t* slices) const;
-    void scatter(const std::uint64_t* slices, unsigned count, unsigned word, PackedBlocks& blocks) const;
+    void gather(const PackedBlocks& information, unsigned word, unsigned count);
+    void scatter(unsigned stream, unsigned word, unsigned count, PackedBlocks& blocks) const;
 
     unsigned itsK;
     unsigned itsWords;

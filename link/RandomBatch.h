@@ -1,0 +1,57 @@
+// RandomBatch: random blocks that are drawn together.
+#ifndef MORVIK_LINK_RANDOMBATCH_H
+#define MORVIK_LINK_RANDOMBATCH_H
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "Random.h"
+#include "SamplerForm.h"
+
+namespace morvik::link {
+
+/// Use: clear, put up counters, draw, then fetch.
+class RandomBatch {
+public:
+    RandomBatch(const RandomKey& key, const SamplerForm& form) : itsKey(key), itsForm(form) {}
+
+    void clear()
+    {
+        itsLow.clear();
+        itsHigh.clear();
+    }
+
+    void put(std::uint64_t counterLow, std::uint64_t counterHigh)
+    {
+        itsLow.push_back(counterLow);
+        itsHigh.push_back(counterHigh);
+    }
+
+    void draw()
+    {
+        itsForm.randomBlocks(itsKey, itsLow.data(), itsHigh.data(), itsLow.size());
+    }
+
+    /// Words 0 and 1 of the random block of counter i.
+    std::uint64_t low(std::size_t i) const
+    {
+        return itsLow[i];
+    }
+
+    /// Words 2 and 3.
+    std::uint64_t high(std::size_t i) const
+    {
+        return itsHigh[i];
+    }
+
+private:
+    RandomKey itsKey;
+    SamplerForm itsForm;
+    std::vector<std::uint64_t> itsLow;
+    std::vector<std::uint64_t> itsHigh;
+};
+
+}  // namespace morvik::link
+
+#endif

@@ -1,0 +1,295 @@
+// SamplerFormX86: draws quantised values with vector instructions.
+//
+// A vector holds words 0 and 1 of its random blocks, side by side, and another one words 2 and 3: what chooses the
+// entries of as many values as it has bytes, and what is compared with their thresholds.
+//
+// Functions are compiled for their instruction set one by one, so that none of this serves another machine.
+#include "SamplerFormX86.h"
+
+#if defined(MORVIK_LINK_X86)
+
+#include <immintrin.h>
+
+#include <algorithm>
+#include <cstring>
+
+#define MORVIK_AVX512 __attribute__((target("avx512f,avx512bw,avx512vbmi")))
+#define MORVIK_AVX2 __attribute__((target("avx2")))
+#define MORVIK_INLINE inline __attribute__((always_inline))
+
+namespace morvik::link {
+
+namespace {
+
+constexpr unsigned rounds = 10;
+
+// Philox4x32: the multipliers of words 0 and 2.
+constexpr std::uint32_t multiplier0 = 0xD2511F53;
+constexpr std::uint32_t multiplier2 = 0xCD9E8D57;
+
+/// The key's two words in each round.
+struct RoundKeys {
+    std::array<int, rounds> word0{};
+    std::array<int, rounds> word1{};
+
+    explicit RoundKeys(const RandomKey& key)
+    {
+        constexpr std::uint32_t step0 = 0x9E3779B9;
+        constexpr std::uint32_t step1 = 0xBB67AE85;
+        for (unsigned r = 0; r < rounds; ++r) {
+            word0[r] = static_cast<int>(key[0] + r * step0);
+            word1[r] = static_cast<int>(key[1] + r * step1);
+        }
+    }
+};
+
+std::uint64_t lowBits(unsigned count)
+{
+    return ~std::uint64_t{0} >> (64 - count);
+}
+
+// 512 bits: 64 values.
+
+/// Words 0 and 1 of eight random blocks, and words 2 and 3.
+struct Random512 {
+    __m512i low;
+    __m512i high;
+};
+
+/// From counters to random blocks. A round multiplies word 0 and word 2; of each product, the low half becomes the odd
+/// word of the other pair, and the high half, with that pair's odd word and a word of the key added, its even word.
+template <std::size_t count>
+MORVIK_AVX512 MORVIK_INLINE void philox(const RoundKeys& keys, Random512 (&random)[count])
+{
+    constexpr __mmask16 odd = 0xAAAA;
+    constexpr int sum = 0x96;
+    const __m512i times0 = _mm512_set1_epi64(multiplier0);
+    const __m512i times2 = _mm512_set1_epi64(multiplier2);
+    for (unsigned r = 0; r < rounds; ++r) {
+        const __m512i key0 = _mm512_set1_epi32(keys.word0[r]);
+        const __m512i key1 = _mm512_set1_epi32(keys.word1[r]);
+        for (auto& [low, high] : random) {
+            const __m512i product0 = _mm512_mul_epu32(low, times0);
+            const __m512i product2 = _mm512_mul_epu32(high, times2);
+            low = _mm512_mask_ternarylogic_epi32(product2, odd, low, key0, sum);
+            high = _mm512_mask_ternarylogic_epi32(product0, odd, high, key1, sum);
+            low = _mm512_shuffle_epi32(low, _MM_PERM_CDAB);
+            high = _mm512_shuffle_epi32(high, _MM_PERM_CDAB);
+        }
+    }
+}
+
+/// A table of 256 bytes.
+struct Table512 {
+    __m512i quarter[4];
+};
+
+MORVIK_AVX512 MORVIK_INLINE Table512 loadTable512(const std::array<std::uint8_t, 256>& bytes)
+{
+    return {{_mm512_loadu_si512(&bytes[0]),
+             _mm512_loadu_si512(&bytes[64]),
+             _mm512_loadu_si512(&bytes[128]),
+             _mm512_loadu_si512(&bytes[192])}};
+}
+
+/// The bytes of a table that `entries` name; `upper` marks those in the table's second half.
+MORVIK_AVX512 MORVIK_INLINE __m512i lookUp(const Table512& table, __m512i entries, __mmask64 upper)
+{
+    return _mm512_mask_mov_epi8(_mm512_permutex2var_epi8(table.quarter[0], entries, table.quarter[1]),
+                                upper,
+                                _mm512_permutex2var_epi8(table.quarter[2], entries, table.quarter[3]));
+}
+
+MORVIK_AVX512 MORVIK_INLINE void drawGroup(const Table512& thresholds,
+                                           const Table512& aliases,
+                                           const Random512& random,
+                                           ValueGroup& group)
+{
+    const __mmask64 upper = _mm512_movepi8_mask(random.low);
+    const __m512i threshold = lookUp(thresholds, random.low, upper);
+    const __mmask64 own = _mm512_cmple_epu8_mask(random.high, threshold);
+    const __m512i value = _mm512_mask_mov_epi8(lookUp(aliases, random.low, upper), own, random.low);
+    const __m512i sent = _mm512_mask_sub_epi8(value, ~group.bits, _mm512_setzero_si512(), value);
+    const __mmask64 used = lowBits(group.count);
+    _mm512_mask_storeu_epi8(group.values, used, sent);
+    group.undecided = _mm512_cmpeq_epu8_mask(random.high, threshold) & used;
+    group.ends = _mm512_cmplt_epi8_mask(_mm512_add_epi8(value, _mm512_set1_epi8(1)), _mm512_set1_epi8(-126)) & used;
+}
+
+template <std::size_t count>
+MORVIK_AVX512 MORVIK_INLINE void drawGroups(const RoundKeys& keys,
+                                            const Table512& thresholds,
+                                            const Table512& aliases,
+                                            ValueGroup* groups)
+{
+    Random512 random[count];
+    for (std::size_t g = 0; g < count; ++g) {
+        random[g] = {_mm512_add_epi64(_mm512_set1_epi64(static_cast<long long>(groups[g].counterLow)),
+                                      _mm512_setr_epi64(0, 1, 2, 3, 4, 5, 6, 7)),
+                     _mm512_set1_epi64(static_cast<long long>(groups[g].counterHigh))};
+    }
+    philox(keys, random);
+    for (std::size_t g = 0; g < count; ++g) {
+        drawGroup(thresholds, aliases, random[g], groups[g]);
+    }
+}
+
+}  // namespace
+
+MORVIK_AVX512 void drawAvx512(const AliasTable& table, const RandomKey& key, ValueGroup* groups, std::size_t count)
+{
+    const RoundKeys keys(key);
+    const Table512 thresholds = loadTable512(table.highThreshold);
+    const Table512 aliases = loadTable512(table.alias);
+    std::size_t done = 0;
+    for (; done + 4 <= count; done += 4) {
+        drawGroups<4>(keys, thresholds, aliases, groups + done);
+    }
+    for (; done < count; ++done) {
+        drawGroups<1>(keys, thresholds, aliases, groups + done);
+    }
+}
+
+MORVIK_AVX512 void randomBlocksAvx512(const RandomKey& key, std::uint64_t* low, std::uint64_t* high, std::size_t count)
+{
+    const RoundKeys keys(key);
+    for (std::size_t done = 0; done < count; done += 8) {
+        const auto used = static_cast<__mmask8>(lowBits(static_cast<unsigned>(std::min<std::size_t>(8, count - done))));
+        Random512 random[] = {
+            {_mm512_maskz_loadu_epi64(used, low + done), _mm512_maskz_loadu_epi64(used, high + done)}};
+        philox(keys, random);
+        _mm512_mask_storeu_epi64(low + done, used, random[0].low);
+        _mm512_mask_storeu_epi64(high + done, used, random[0].high);
+    }
+}
+
+// 256 bits: 32 values.
+
+namespace {
+
+struct Random256 {
+    __m256i low;
+    __m256i high;
+};
+
+/// As above.
+template <std::size_t count>
+MORVIK_AVX2 MORVIK_INLINE void philox(const RoundKeys& keys, Random256 (&random)[count])
+{
+    const __m256i odd = _mm256_set1_epi64x(static_cast<long long>(0xFFFFFFFF00000000));
+    const __m256i times0 = _mm256_set1_epi64x(multiplier0);
+    const __m256i times2 = _mm256_set1_epi64x(multiplier2);
+    for (unsigned r = 0; r < rounds; ++r) {
+        const __m256i key0 = _mm256_set1_epi32(keys.word0[r]);
+        const __m256i key1 = _mm256_set1_epi32(keys.word1[r]);
+        for (auto& [low, high] : random) {
+            const __m256i product0 = _mm256_mul_epu32(low, times0);
+            const __m256i product2 = _mm256_mul_epu32(high, times2);
+            low = _mm256_xor_si256(product2, _mm256_and_si256(_mm256_xor_si256(low, key0), odd));
+            high = _mm256_xor_si256(product0, _mm256_and_si256(_mm256_xor_si256(high, key1), odd));
+            low = _mm256_shuffle_epi32(low, 0xB1);
+            high = _mm256_shuffle_epi32(high, 0xB1);
+        }
+    }
+}
+
+/// Bytes of a half of a table, of which the entries' seven low bits name one: `count` sixteenths from `bytes` on. The
+/// highest bit of `choice` tells the halves of what is left apart, its next bit their halves. Entries with their
+/// highest bit set get zeros.
+template <unsigned count>
+MORVIK_AVX2 MORVIK_INLINE __m256i lookUpHalf(const std::uint8_t* bytes, __m256i entries, __m256i choice)
+{
+    if constexpr (count == 1) {
+        const __m128i sixteenth = _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
+        return _mm256_shuffle_epi8(_mm256_broadcastsi128_si256(sixteenth), entries);
+    } else {
+        const __m256i next = _mm256_add_epi8(choice, choice);
+        return _mm256_blendv_epi8(lookUpHalf<count / 2>(bytes, entries, next),
+                                  lookUpHalf<count / 2>(bytes + 8 * count, entries, next),
+                                  choice);
+    }
+}
+
+/// The bytes of a table that `entries` name.
+MORVIK_AVX2 MORVIK_INLINE __m256i lookUp(const std::array<std::uint8_t, 256>& table, __m256i entries)
+{
+    const __m256i choice = _mm256_add_epi8(entries, entries);
+    const __m256i others = _mm256_xor_si256(entries, _mm256_set1_epi8(-128));
+    return _mm256_or_si256(lookUpHalf<8>(&table[0], entries, choice), lookUpHalf<8>(&table[128], others, choice));
+}
+
+/// A byte of ones for each bit that is 0.
+MORVIK_AVX2 MORVIK_INLINE __m256i bytesOfZeros(std::uint32_t bits)
+{
+    const __m256i spread = _mm256_setr_epi8(
+        0, 0, 0, 0, 0, 0, 0, 0, 1, 1, 1, 1, 1, 1, 1, 1, 2, 2, 2, 2, 2, 2, 2, 2, 3, 3, 3, 3, 3, 3, 3, 3);
+    const __m256i place = _mm256_set1_epi64x(static_cast<long long>(0x8040201008040201));
+    const __m256i bytes = _mm256_shuffle_epi8(_mm256_set1_epi32(static_cast<int>(bits)), spread);
+    return _mm256_cmpeq_epi8(_mm256_and_si256(bytes, place), _mm256_setzero_si256());
+}
+
+MORVIK_AVX2 MORVIK_INLINE std::uint64_t maskOf(__m256i bytes)
+{
+    return static_cast<std::uint32_t>(_mm256_movemask_epi8(bytes));
+}
+
+/// What is left to the caller of 32 values.
+struct Left32 {
+    std::uint64_t undecided;
+    std::uint64_t ends;
+};
+
+/// Draws half a group.
+MORVIK_AVX2 MORVIK_INLINE Left32 drawHalf(const AliasTable& table,
+                                          const Random256& random,
+                                          std::uint32_t bits,
+                                          std::int8_t* values)
+{
+    const __m256i threshold = lookUp(table.highThreshold, random.low);
+    const __m256i own = _mm256_cmpeq_epi8(_mm256_min_epu8(random.high, threshold), random.high);
+    const __m256i value = _mm256_blendv_epi8(lookUp(table.alias, random.low), random.low, own);
+    const __m256i negated = bytesOfZeros(bits);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(values), _mm256_sub_epi8(_mm256_xor_si256(value, negated), negated));
+    return {maskOf(_mm256_cmpeq_epi8(random.high, threshold)),
+            maskOf(_mm256_cmpgt_epi8(_mm256_set1_epi8(-126), _mm256_add_epi8(value, _mm256_set1_epi8(1))))};
+}
+
+}  // namespace
+
+MORVIK_AVX2 void drawAvx2(const AliasTable& table, const RandomKey& key, ValueGroup* groups, std::size_t count)
+{
+    const RoundKeys keys(key);
+    for (ValueGroup* group = groups; group != groups + count; ++group) {
+        const __m256i low = _mm256_set1_epi64x(static_cast<long long>(group->counterLow));
+        const __m256i high = _mm256_set1_epi64x(static_cast<long long>(group->counterHigh));
+        Random256 random[] = {{_mm256_add_epi64(low, _mm256_setr_epi64x(0, 1, 2, 3)), high},
+                              {_mm256_add_epi64(low, _mm256_setr_epi64x(4, 5, 6, 7)), high}};
+        philox(keys, random);
+        std::int8_t values[64];
+        const Left32 first = drawHalf(table, random[0], static_cast<std::uint32_t>(group->bits & 0xFFFFFFFF), values);
+        const Left32 second = drawHalf(table, random[1], static_cast<std::uint32_t>(group->bits >> 32), values + 32);
+        std::memcpy(group->values, values, group->count);
+        const std::uint64_t used = lowBits(group->count);
+        group->undecided = (first.undecided | second.undecided << 32) & used;
+        group->ends = (first.ends | second.ends << 32) & used;
+    }
+}
+
+MORVIK_AVX2 void randomBlocksAvx2(const RandomKey& key, std::uint64_t* low, std::uint64_t* high, std::size_t count)
+{
+    const RoundKeys keys(key);
+    for (std::size_t done = 0; done < count; done += 4) {
+        const __m256i left = _mm256_set1_epi64x(static_cast<long long>(count - done));
+        const __m256i used = _mm256_cmpgt_epi64(left, _mm256_setr_epi64x(0, 1, 2, 3));
+        auto* const lows = reinterpret_cast<long long*>(low + done);
+        auto* const highs = reinterpret_cast<long long*>(high + done);
+        Random256 random[] = {{_mm256_maskload_epi64(lows, used), _mm256_maskload_epi64(highs, used)}};
+        philox(keys, random);
+        _mm256_maskstore_epi64(lows, used, random[0].low);
+        _mm256_maskstore_epi64(highs, used, random[0].high);
+    }
+}
+
+}  // namespace morvik::link
+
+#endif
