@@ -7,11 +7,14 @@ namespace morvik::link {
 
 double defaultScale(int algorithmType, unsigned K, int milliDecibels)
 {
+    constexpr double one = 8;  // steps, in the format of the soft inputs
     if (algorithmType < 2) {
-        return 8;
+        return one;
     }
+    // A metric counts a soft value s as +s for a bit 1 and as -s for a bit 0, so the logarithms of their probabilities
+    // differ by 2 s. With noise of variance v, they differ by 2 y / v for what is received, y.
     const long double deviation = noiseDeviation(K, milliDecibels);
-    return static_cast<double>(8 / (deviation * deviation));
+    return static_cast<double>(one / (deviation * deviation));
 }
 
 }  // namespace morvik::link

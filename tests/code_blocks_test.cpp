@@ -1,13 +1,12 @@
 // Code blocks: every block size and every configuration decodes what was encoded.
 #include <gtest/gtest.h>
 
-#include <fstream>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "support/Blocks.h"
 #include "support/Configurations.h"
+#include "support/SentBlocks.h"
 
 namespace {
 
@@ -21,37 +20,6 @@ class EveryConfiguration : public testing::TestWithParam<Configuration> {
 protected:
     blocks::Decoder decoder{std::get<0>(GetParam()), std::get<1>(GetParam())};
 };
-
-struct SentBlock {
-    blocks::Block soft;
-    std::string bits;
-};
-
-std::vector<SentBlock> readVectors(const std::string& name)
-{
-    const std::string path = MORVIK_TEST_DATA "/vectors/" + name;
-    std::vector<SentBlock> blocks;
-    std::ifstream bits(path + ".bits");
-    for (std::string line; std::getline(bits, line);) {
-        blocks.push_back({{}, line});
-    }
-    std::ifstream rows(path + ".csv");
-    std::string row;
-    std::getline(rows, row);
-    while (std::getline(rows, row)) {
-        std::istringstream fields(row);
-        std::size_t block = 0;
-        std::int32_t sys = 0;
-        std::int32_t par1 = 0;
-        std::int32_t par2 = 0;
-        char comma = 0;
-        fields >> block >> comma >> sys >> comma >> par1 >> comma >> par2;
-        blocks.at(block).soft.sys.push_back(sys);
-        blocks.at(block).soft.par1.push_back(par1);
-        blocks.at(block).soft.par2.push_back(par2);
-    }
-    return blocks;
-}
 
 }  // namespace
 
@@ -81,10 +49,10 @@ TEST_P(EveryConfiguration, DecodesNoisyBlocks)
 
 TEST_P(EveryConfiguration, DecodesTheVectorsOfAnotherEncoder)
 {
-    for (const std::string name : {"k40", "k104", "k512", "k1024", "k2048", "k6144"}) {
-        const std::vector<SentBlock> blocks = readVectors(name);
-        ASSERT_FALSE(blocks.empty()) << name;
-        for (const SentBlock& block : blocks) {
+    for (const std::string& name : blocks::sentBlockNames()) {
+        const std::vector<blocks::SentBlock> sent = blocks::readSentBlocks(name);
+        ASSERT_FALSE(sent.empty()) << name;
+        for (const blocks::SentBlock& block : sent) {
             std::string decided;
             for (const std::uint8_t bit : decoder.decode(block.soft, 8).bits) {
                 decided += bit != 0 ? '1' : '0';

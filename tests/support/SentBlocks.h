@@ -1,0 +1,24 @@
+// SentBlocks: the blocks of tests/data/vectors, which another encoder made, with the bits that were sent.
+#ifndef MORVIK_TESTS_SENTBLOCKS_H
+#define MORVIK_TESTS_SENTBLOCKS_H
+
+#include <string>
+#include <vector>
+
+#include "Blocks.h"
+
+namespace blocks {
+
+struct SentBlock {
+    Block soft;
+    std::string bits;  ///< K characters, 0 or 1
+};
+
+/// The names of all files of blocks.
+const std::vector<std::string>& sentBlockNames();
+
+std::vector<SentBlock> readSentBlocks(const std::string& name);
+
+}  // namespace blocks
+
+#endif
