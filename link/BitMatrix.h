@@ -3,6 +3,7 @@
 #define MORVIK_LINK_BITMATRIX_H
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 
 namespace morvik::link {
@@ -17,7 +18,7 @@ void transposeStep(const BitMatrix& from, BitMatrix& to)
 {
     constexpr std::uint64_t left =
         ~std::uint64_t{0} / ((std::uint64_t{1} << half) + 1);  // `half` of every 2 `half` bits
-    for (unsigned r = 0; r < 32; ++r) {
+    for (std::size_t r = 0; r < 32; ++r) {
         const std::uint64_t upper = from[r];
         const std::uint64_t lower = from[r + 32];
         to[2 * r] = (upper & left) | (lower & left) << half;

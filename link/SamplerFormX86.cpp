@@ -8,6 +8,10 @@
 
 #if defined(MORVIK_LINK_X86)
 
+#if !defined(__clang__)
+// g++ 12 takes the undefined operands in its own header of AVX-512 for mistakes.
+#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+#endif
 #include <immintrin.h>
 
 #include <algorithm>
@@ -86,7 +90,7 @@ struct Table512 {
 
 MORVIK_AVX512 MORVIK_INLINE Table512 loadTable512(const std::array<std::uint8_t, 256>& bytes)
 {
-    return {{_mm512_loadu_si512(&bytes[0]),
+    return {{_mm512_loadu_si512(bytes.data()),
              _mm512_loadu_si512(&bytes[64]),
              _mm512_loadu_si512(&bytes[128]),
              _mm512_loadu_si512(&bytes[192])}};
@@ -205,7 +209,7 @@ MORVIK_AVX2 MORVIK_INLINE __m256i lookUpHalf(const std::uint8_t* bytes, __m256i 
     } else {
         const __m256i next = _mm256_add_epi8(choice, choice);
         return _mm256_blendv_epi8(lookUpHalf<count / 2>(bytes, entries, next),
-                                  lookUpHalf<count / 2>(bytes + 8 * count, entries, next),
+                                  lookUpHalf<count / 2>(bytes + std::size_t{8} * count, entries, next),
                                   choice);
     }
 }
@@ -215,7 +219,7 @@ MORVIK_AVX2 MORVIK_INLINE __m256i lookUp(const std::array<std::uint8_t, 256>& ta
 {
     const __m256i choice = _mm256_add_epi8(entries, entries);
     const __m256i others = _mm256_xor_si256(entries, _mm256_set1_epi8(-128));
-    return _mm256_or_si256(lookUpHalf<8>(&table[0], entries, choice), lookUpHalf<8>(&table[128], others, choice));
+    return _mm256_or_si256(lookUpHalf<8>(table.data(), entries, choice), lookUpHalf<8>(&table[128], others, choice));
 }
 
 /// A byte of ones for each bit that is 0.

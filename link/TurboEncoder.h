@@ -3,6 +3,7 @@
 #define MORVIK_LINK_TURBOENCODER_H
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 #include <vector>
 
@@ -10,7 +11,7 @@ namespace morvik::link {
 
 /// Blocks of bits, one after the other, each in `words` words: bit i of a block is bit i % 64 of its word i / 64.
 struct PackedBlocks {
-    unsigned words = 0;
+    std::size_t words = 0;
     std::vector<std::uint64_t> bits;
 
     std::uint64_t* block(unsigned b)

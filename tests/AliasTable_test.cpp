@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstddef>
 #include <random>
 
 namespace {
@@ -63,7 +64,7 @@ TEST(AliasTableTest, DrawsWeightsOfVeryDifferentSize)
 {
     Weights weights{};
     std::uint64_t left = whole;
-    for (unsigned value = 0; value < 48; ++value) {
+    for (std::size_t value = 0; value < 48; ++value) {
         weights[5 * value] = left / 2;
         left -= left / 2;
     }

@@ -45,7 +45,8 @@ SoftValue plainValue(const RoundedDistribution& distribution,
     };
     const unsigned entry = byte(number % 8);
     const std::uint64_t uniform = std::uint64_t{byte(8 + number % 8)} << 32 | refinement[0];
-    int rounded = static_cast<std::int8_t>(uniform < table.threshold(entry) ? entry : table.alias[entry]);
+    const unsigned symbol = uniform < table.threshold(entry) ? entry : table.alias[entry];
+    int rounded = static_cast<int>(symbol) - (symbol < 128 ? 0 : 256);
     if (rounded == 127) {
         rounded += (refinement[1] >= distribution.top[0] ? 1 : 0) + (refinement[1] >= distribution.top[1] ? 1 : 0);
     } else if (rounded == -128) {
@@ -132,9 +133,9 @@ TEST_P(EverySampler, DrawsSeveralFramesTogether)
     const auto draw = [](unsigned together) {
         SoftValueSampler sampler(distributionAt(60), randomKey(4), GetParam());
         const std::vector<std::uint64_t> bits = randomBits(1, 300);
-        std::vector<std::int8_t> values(6 * 300);
+        std::vector<std::int8_t> values(1800);
         std::vector<std::uint32_t> clipped(6);
-        for (unsigned frame = 0; frame < 6; ++frame) {
+        for (std::size_t frame = 0; frame < 6; ++frame) {
             sampler.put(
                 {randomKey(4), K, milliDecibels, frame}, 0, bits.data(), 300, &values[frame * 300], clipped[frame]);
             if (frame % together == together - 1) {
