@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
-# Runs the short lines of the benchmark for a moment: it must succeed, which includes that the decoders
+# Runs the short lines of the benchmarks for a moment: they must succeed, which includes that the decoders
 # decided rightly, and print whole tables.
-#   smoke_test.sh MORVIK_BENCH_PLAIN
+#   smoke_test.sh MORVIK_BENCH_PLAIN MORVIK_BENCH_FRAMES
 set -euo pipefail
 output=$("$1" --filter 'K=40/|compare/K=512/' --repetitions 2 --seconds 0.001)
 fail() {
@@ -27,3 +27,9 @@ expect 1 'probe of what every machine has' "^\\| generic +\\| +8 \\|($positive) 
 if "$1" --filter 'no such line' >/dev/null 2>&1; then
     fail 'a filter that matches nothing is accepted'
 fi
+
+output=$("$2" --repetitions 1 --seconds 0)
+expect 1 'table of frames' '^\| +K \| frames a call \| instructions \|.*\| make / decode \|$'
+for set in $(sed -n -E 's/^\| +[0-9]+ \| +[0-9]+ \| ([a-z0-9]+) .*/\1/p' <<<"$output" | sort -u) generic; do
+    expect 6 "lines of frames with $set" "^\\| +[0-9]+ \\| +[0-9]+ \\| $set +(\\|($positive) ){4}\\|($positive) % \\|\$"
+done

@@ -1,0 +1,155 @@
+// morvik_bench_frames: measures what it takes to make the frames of a simulation, beside decoding them.
+#include <CLI/CLI.hpp>
+#include <iomanip>
+#include <iostream>
+#include <vector>
+
+#include "Measure.h"
+#include "Options.h"
+#include "link/FrameSource.h"
+#include "support/Blocks.h"
+
+#include "morvik_v1_0_batch.h"
+
+namespace {
+
+using namespace morvik::link;
+
+constexpr int milliDecibels = 1000;
+constexpr double scale = 8;
+constexpr std::uint64_t seed = 1;
+
+/// Frames of one size, made and decoded `count` at a time, by stages or as a whole.
+class Stages {
+public:
+    Stages(unsigned K, unsigned count, const SamplerForm& form)
+        : itsK(K),
+          itsCount(count),
+          itsEncoder(K),
+          itsSampler(roundedDistribution(noiseDeviation(K, milliDecibels), scale), randomKey(seed), form),
+          itsSource(K, milliDecibels, scale, seed, Noise::discrete, form),
+          itsDecoder(4, 1)
+    {
+        // The decoder's instruction sets have the same names.
+        veltra_ip_morvik_v1_0_set_instruction_set(itsDecoder.state(), form.name);
+        itsInformation.words = itsEncoder.words();
+        itsInformation.bits.resize(count * itsInformation.words);
+        encode();
+        make();
+    }
+
+    void encode()
+    {
+        itsEncoder.encode(itsInformation, itsCount, itsStreams);
+    }
+
+    /// Random numbers and soft values.
+    void receive()
+    {
+        for (unsigned i = 0; i < itsCount; ++i) {
+            for (unsigned s = 0; s < 3; ++s) {
+                itsSampler.put({randomKey(seed), itsK, milliDecibels, i},
+                               8192 * s,
+                               itsStreams[s].block(i),
+                               itsK + 4,
+                               &itsFrames.streams[s][std::size_t{i} * (itsK + 4)],
+                               itsFrames.clipped[i]);
+            }
+            if (itsSampler.size() >= 256) {
+                itsSampler.draw();
+            }
+        }
+        itsSampler.draw();
+    }
+
+    void make()
+    {
+        itsSource.make(0, itsCount, itsFrames);
+    }
+
+    void decode()
+    {
+        itsDecisions.resize(itsFrames.sent.size());
+        veltra_ip_morvik_v1_0_batch_outputs outputs = {};
+        outputs.dout = itsDecisions.data();
+        outputs.dout_alloc = itsDecisions.size();
+        veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.state(),
+                                                itsFrames.streams[0].data(),
+                                                itsFrames.streams[1].data(),
+                                                itsFrames.streams[2].data(),
+                                                static_cast<std::int32_t>(itsK + 4),
+                                                itsCount,
+                                                bench::iterations,
+                                                nullptr,
+                                                &outputs);
+    }
+
+    /// Cycles for an information bit, the median of the repetitions.
+    double cycles(void (Stages::*stage)(), const bench::Options& options)
+    {
+        const bench::Stopwatch once;
+        (this->*stage)();
+        const auto calls = static_cast<unsigned>(options.seconds / once.stop(1).seconds) + 1;
+        std::vector<double> samples;
+        for (unsigned i = 0; i < options.repetitions; ++i) {
+            const bench::Stopwatch stopwatch;
+            for (unsigned call = 0; call < calls; ++call) {
+                (this->*stage)();
+            }
+            samples.push_back(stopwatch.stop(calls).cycles / (double{1} * itsK * itsCount));
+        }
+        return bench::median(samples);
+    }
+
+private:
+    unsigned itsK;
+    unsigned itsCount;
+    TurboEncoder itsEncoder;
+    SoftValueSampler itsSampler;
+    FrameSource itsSource;
+    blocks::Decoder itsDecoder;
+    PackedBlocks itsInformation;
+    TurboEncoder::Streams itsStreams;
+    Frames itsFrames;
+    std::vector<std::uint8_t> itsDecisions;
+};
+
+void measure(const bench::Options& options)
+{
+    std::cout
+        << "Making frames, and decoding them with 4 units, type 1, " << bench::iterations
+        << " iterations: cycles for an information bit\n\n"
+        << "|    K | frames a call | instructions | encode | soft values | make, in all | decode | make / decode |\n"
+        << "|-----:|--------------:|--------------|-------:|------------:|-------------:|-------:|--------------:|\n"
+        << std::fixed << std::setprecision(2);
+    for (const SamplerForm& form : samplerForms()) {
+        for (const unsigned K : {6144U, 512U, 40U}) {
+            for (const unsigned count : {64U, 16U}) {
+                Stages stages(K, count, form);
+                const double encode = stages.cycles(&Stages::encode, options);
+                const double receive = stages.cycles(&Stages::receive, options);
+                const double make = stages.cycles(&Stages::make, options);
+                const double decode = stages.cycles(&Stages::decode, options);
+                std::cout << "| " << std::setw(4) << K << " | " << std::setw(13) << count << " | " << std::left
+                          << std::setw(12) << form.name << std::right << " | " << std::setw(6) << encode << " | "
+                          << std::setw(11) << receive << " | " << std::setw(12) << make << " | " << std::setw(6)
+                          << decode << " | " << std::setw(11) << 100 * make / decode << " % |\n"
+                          << std::flush;
+            }
+        }
+    }
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    CLI::App app("Measures what it takes to make the frames of a simulation.", "morvik_bench_frames");
+    bench::Options options;
+    app.add_option("--repetitions", options.repetitions, "Of each figure, which is their median")
+        ->check(CLI::Range(1U, 1000U));
+    app.add_option("--seconds", options.seconds, "That a repetition takes at least")->check(CLI::Range(0.0, 100.0));
+    CLI11_PARSE(app, argc, argv);
+    measure(options);
+    return 0;
+}
