@@ -5,6 +5,8 @@
 #include <sstream>
 #include <string>
 
+#include "morvik_v1_0_batch.h"
+
 namespace morvik {
 
 namespace {
@@ -54,6 +56,14 @@ Decoder::Decoder(const veltra_ip_morvik_v1_0_generics& generics, std::ostream& m
     const Redirection redirection(itsMessages);
     itsState.reset(veltra_ip_morvik_v1_0_create_state(generics));
     if (!itsState) {
+        throw Refusal(redirection.errors());
+    }
+}
+
+void Decoder::useInstructionSet(const std::string& name)
+{
+    const Redirection redirection(itsMessages);
+    if (veltra_ip_morvik_v1_0_set_instruction_set(itsState.get(), name.c_str()) != 0) {
         throw Refusal(redirection.errors());
     }
 }

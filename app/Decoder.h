@@ -6,6 +6,7 @@
 #include <memory>
 #include <ostream>
 #include <stdexcept>
+#include <string>
 #include <vector>
 
 #include "SoftBlock.h"
@@ -27,6 +28,9 @@ class Decoder {
 public:
     /// Throws Refusal when the generics are not allowed. `messages` outlives the decoder.
     Decoder(const veltra_ip_morvik_v1_0_generics& generics, std::ostream& messages);
+
+    /// Decodes with another instruction set, as morvik_v1_0_batch.h names them. Throws Refusal.
+    void useInstructionSet(const std::string& name);
 
     /// Traces the next `passes` half-iterations, counted across blocks.
     void armTrace(std::uint32_t passes);

@@ -4,8 +4,10 @@
 #include <string>
 #include <vector>
 
+#include "Ber.h"
 #include "Command.h"
 #include "Decode.h"
+#include "Merge.h"
 
 namespace {
 
@@ -45,7 +47,7 @@ int main(int argc, char** argv)
     app.require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
     app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
 
-    const std::vector<Command> commands = {morvik::addDecode(app)};
+    const std::vector<Command> commands = {morvik::addDecode(app), morvik::addBer(app), morvik::addMerge(app)};
 
     try {
         app.parse(argc, argv);

@@ -1,0 +1,131 @@
+// Ber: the subcommand that simulates error rates.
+#include "Ber.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <iostream>
+#include <memory>
+#include <optional>
+#include <string>
+#include <thread>
+
+#include "BerOptions.h"
+#include "Decoder.h"
+#include "Interruption.h"
+#include "LiveTable.h"
+#include "simulation/AtomicFile.h"
+#include "simulation/Error.h"
+#include "simulation/Journal.h"
+#include "simulation/Replay.h"
+#include "simulation/Run.h"
+#include "simulation/ThreadWorkers.h"
+
+namespace morvik {
+
+namespace {
+
+/// Watches a run in silence.
+class NoTable : public simulation::Progress {
+public:
+    void isAt(const simulation::PointResult&) override {}
+    void hasEnded(const simulation::PointResult&) override {}
+};
+
+std::unique_ptr<simulation::Progress> progressOf(const BerOptions& options, const simulation::Plan& plan)
+{
+    if (options.quiet) {
+        return std::make_unique<NoTable>();
+    }
+    return std::make_unique<LiveTable>(plan, std::cout, terminalWidth());
+}
+
+/// Throws Refusal, with the decoder's reason, if it knows no such instruction set.
+void checkInstructionSet(const std::string& name)
+{
+    if (!name.empty()) {
+        Decoder(veltra_ip_morvik_v1_0_get_default_generics(), std::cerr).useInstructionSet(name);
+    }
+}
+
+int simulate(const BerOptions& options, const simulation::Plan& plan)
+{
+    using simulation::Journal;
+    Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
+    if (options.resume && !journal.isResumed()) {
+        std::cerr << "morvik ber: no " << journal.checkpointName() << " to go on from, starts from the beginning"
+                  << std::endl;
+    }
+    const unsigned threads = options.threads > 0 ? options.threads : std::max(std::thread::hardware_concurrency(), 1U);
+    const Interruption interruption;
+    bool isComplete = false;
+    {
+        simulation::ThreadWorkers workers(plan, threads, options.instructionSet);
+        const auto progress = progressOf(options, plan);
+        isComplete = run(plan, {workers, journal, *progress, [] {
+                                    return Interruption::signal() != 0;
+                                }});
+    }
+    if (isComplete) {
+        return success;
+    }
+    std::cerr << "morvik ber: interrupted"
+              << (options.output.empty() ? "" : ", --resume goes on from " + journal.checkpointName()) << std::endl;
+    return 128 + Interruption::signal();
+}
+
+/// The files are named after the output, but never overwrite it.
+int replayFrame(const BerOptions& options, const simulation::Plan& plan, const ReplayedFrame& replayed)
+{
+    if (replayed.point >= plan.points.size()) {
+        throw simulation::Error("--replay: there is no point " + std::to_string(replayed.point) + ", the last one is " +
+                                std::to_string(plan.points.size() - 1));
+    }
+    const auto [softValues, sentBits, wrongBits] =
+        simulation::replay(plan, replayed.point, replayed.frame, options.instructionSet);
+    const std::string stem = std::filesystem::path(options.output).replace_extension().string();
+    const std::string name = stem + (stem.empty() ? "" : ".") + "point" + std::to_string(replayed.point) + ".frame" +
+                             std::to_string(replayed.frame);
+    simulation::writeAtomically(name + ".csv", softValues);
+    simulation::writeAtomically(name + ".bits", sentBits);
+
+    const simulation::Point& point = plan.points[replayed.point];
+    std::cout << wrongBits << (wrongBits == 1 ? " wrong bit\n" : " wrong bits\n") << "morvik decode " << name
+              << ".csv --reference " << name << ".bits --num-pu " << point.numPu << " --algorithm "
+              << simulation::algorithmName(point.algorithm) << " --iterations " << point.iterations << std::endl;
+    return success;
+}
+
+int ber(const BerOptions& options)
+{
+    const simulation::Plan plan = planOf(options);
+    checkInstructionSet(options.instructionSet);
+    return options.replay ? replayFrame(options, plan, *options.replay) : simulate(options, plan);
+}
+
+/// The end of the help text.
+constexpr char explanation[] = R"(
+Simulates every combination of the options that take lists, with BPSK over white Gaussian
+noise; Eb/N0 counts the tail, at a rate of K / (3 K + 12). The same seed gives the same
+results whatever the number of threads or the machine. docs/error_rates.md tells the rest.
+
+Exit status: 0 all simulated, 2 bad input or usage, 128 and the signal's number when a
+signal ended the run; --resume goes on then, as it does after a crash.
+
+Example: the waterfall of 512 bits for two and eight units
+  morvik ber --block-size 512 --num-pu 2,8 --output k512.csv)";
+
+}  // namespace
+
+Command addBer(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("ber", "Simulate bit and block error rates");
+    const auto options = std::make_shared<BerOptions>();
+    addBerOptions(*command, *options);
+    command->footer(explanation);
+    const auto run = [options] {
+        return ber(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik

@@ -1,0 +1,404 @@
+// BerOptions: the arguments of `morvik ber`.
+#include "BerOptions.h"
+
+#include <array>
+#include <charconv>
+#include <functional>
+#include <system_error>
+#include <utility>
+#include <vector>
+
+#include "Arguments.h"
+#include "Lists.h"
+#include "Text.h"
+#include "simulation/Error.h"
+#include "simulation/Thousandths.h"
+#include "standard/BlockSizes.h"
+
+namespace morvik {
+
+namespace {
+
+using simulation::parseThousandths;
+using simulation::thousandthsText;
+
+constexpr std::uint64_t defaultBlockErrors = 100;
+constexpr std::uint64_t defaultMaxBlocks = 1000000;
+constexpr double defaultStopBler = 1e-4;
+constexpr int largestMilliDecibels = 50000;
+constexpr int largestMilliScale = 1000000;
+
+[[noreturn]] void refuse(const std::string& option, const std::string& text, const std::string& allowed)
+{
+    throw CLI::ValidationError(option, shown(text) + " is not allowed, " + allowed);
+}
+
+// ---- Elements of the lists
+
+void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
+{
+    const auto K = parseInteger<std::uint32_t>(text);
+    const auto& sizes = standard::blockSizes;
+    if (!K || *K < sizes.front().K || *K > sizes.back().K) {
+        refuse("--block-size", text, "allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
+    }
+    if (standard::findBlockSize(*K) == nullptr) {
+        std::size_t above = 0;
+        while (sizes[above].K < *K) {
+            ++above;
+        }
+        refuse("--block-size",
+               text,
+               "the nearest block sizes of 3GPP TS 36.212 are " + std::to_string(sizes[above - 1].K) + " and " +
+                   std::to_string(sizes[above].K));
+    }
+    values.push_back(*K);
+}
+
+void appendNumPu(const std::string& text, std::vector<unsigned>& values)
+{
+    if (text != "2" && text != "4" && text != "8") {
+        refuse("--num-pu", text, "allowed are 2, 4, 8");
+    }
+    values.push_back(static_cast<unsigned>(text[0] - '0'));
+}
+
+void appendAlgorithm(const std::string& text, std::vector<unsigned>& values)
+{
+    const auto algorithm = simulation::algorithmOf(text);
+    if (!algorithm) {
+        refuse("--algorithm", text, "allowed are 0, 1, 2, max-log, scaled, table");
+    }
+    values.push_back(*algorithm);
+}
+
+void appendScale(const std::string& text, std::vector<simulation::ScaleOption>& values)
+{
+    if (text == "auto") {
+        values.emplace_back();
+        return;
+    }
+    const auto milliScale = parseThousandths(text);
+    if (!milliScale || *milliScale <= 0 || *milliScale > largestMilliScale) {
+        refuse("--scale", text, "allowed are auto and the numbers above 0 up to 1000, with at most three decimals");
+    }
+    values.emplace_back(*milliScale);
+}
+
+void appendIterations(const std::string& text, std::vector<unsigned>& values)
+{
+    const auto iterations = parseInteger<std::uint32_t>(text);
+    if (!iterations || *iterations < 1 || *iterations > 15) {
+        refuse("--iterations", text, "allowed are the integers 1 to 15");
+    }
+    values.push_back(*iterations);
+}
+
+int milliDecibels(const std::string& text)
+{
+    const auto value = parseThousandths(text);
+    if (!value || *value < -largestMilliDecibels || *value > largestMilliDecibels) {
+        refuse("--ebn0", text, "allowed are -50 to 50 dB, with at most three decimals, and START:STEP:STOP");
+    }
+    return *value;
+}
+
+void appendEbn0(const std::string& text, std::vector<int>& values)
+{
+    const std::vector<std::string> parts = splitAt(':', text);
+    if (parts.size() == 1) {
+        values.push_back(milliDecibels(text));
+        return;
+    }
+    if (parts.size() != 3) {
+        refuse("--ebn0", text, "a range is START:STEP:STOP");
+    }
+    const int start = milliDecibels(parts[0]);
+    const int step = milliDecibels(parts[1]);
+    const int stop = milliDecibels(parts[2]);
+    if (step <= 0) {
+        refuse("--ebn0", text, "the step of a range has to be above 0");
+    }
+    if (stop < start) {
+        refuse("--ebn0", text, "the range is empty: its stop is below its start");
+    }
+    for (int value = start; value <= stop; value += step) {
+        values.push_back(value);
+    }
+}
+
+// ---- Single values
+
+/// Reads a count of at least 1.
+std::function<void(const std::string&)> countInto(const std::string& option, std::optional<std::uint64_t>& count)
+{
+    return [option, &count](const std::string& text) {
+        count = parseInteger<std::uint64_t>(text);
+        if (!count || *count == 0) {
+            refuse(option, text, "allowed are the integers from 1 on");
+        }
+    };
+}
+
+std::optional<double> parseReal(std::string_view text)
+{
+    double value = 0;
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value);
+    if (result.ec != std::errc() || result.ptr != end) {
+        return std::nullopt;
+    }
+    return value;
+}
+
+/// Reads 90, 90s, 1.5m or 2h.
+double parseSeconds(const std::string& text)
+{
+    double unit = 1;
+    std::string number = text;
+    for (const auto& [letter, seconds] : {std::pair('s', 1.0), std::pair('m', 60.0), std::pair('h', 3600.0)}) {
+        if (!number.empty() && number.back() == letter) {
+            number.pop_back();
+            unit = seconds;
+            break;
+        }
+    }
+    const auto value = parseReal(number);
+    if (!value || !(*value > 0 && *value < 1e9)) {
+        refuse("--max-time", text, "allowed are numbers above 0, of seconds, or with s, m or h behind them");
+    }
+    return *value * unit;
+}
+
+double parseStopBler(const std::string& text)
+{
+    const auto value = parseReal(text);
+    if (!value || !(*value >= 0 && *value <= 1)) {
+        refuse("--stop-bler", text, "allowed are the numbers from 0 to 1");
+    }
+    return *value;
+}
+
+simulation::FrameRange parseFrames(const std::string& text)
+{
+    const auto frames = simulation::parseFrameRange(text);
+    if (!frames) {
+        refuse("--frames", text, "allowed is FROM:TO, two integers, with FROM below TO");
+    }
+    return *frames;
+}
+
+ReplayedFrame parseReplay(const std::string& text)
+{
+    const std::vector<std::string> parts = splitAt(':', text);
+    const auto point = parseInteger<std::uint32_t>(parts.front());
+    const auto frame = parseInteger<std::uint64_t>(parts.back());
+    if (parts.size() != 2 || !point || !frame) {
+        refuse("--replay", text, "allowed is POINT:FRAME, two integers as in the results");
+    }
+    return {*point, *frame};
+}
+
+std::string realText(double value)
+{
+    std::array<char, 32> text = {};
+    return std::string(text.data(), std::to_chars(text.data(), text.data() + text.size(), value).ptr);
+}
+
+// ---- The options in groups
+
+void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
+{
+    addListOption(command, "--block-size", sweep.blockSizes, appendBlockSize, "Bits of a block, K")
+        ->required()
+        ->type_name("K[,K...]");
+    sweep.numPus = {4};
+    addListOption(command, "--num-pu", sweep.numPus, appendNumPu, "Parallel processing units: 2, 4 or 8")
+        ->type_name("N[,N...]")
+        ->default_str("4");
+    sweep.algorithms = {1};
+    addListOption(command,
+                  "--algorithm",
+                  sweep.algorithms,
+                  appendAlgorithm,
+                  "0 or max-log: max-log-MAP; 1 or scaled: extrinsic values times 0.75; 2 or table: correction table")
+        ->type_name("TYPE[,TYPE...]")
+        ->default_str("scaled");
+    sweep.scaleOptions = {std::nullopt};
+    addListOption(command,
+                  "--scale",
+                  sweep.scaleOptions,
+                  appendScale,
+                  "Steps of the soft values for amplitude 1; auto: what suits the algorithm and Eb/N0")
+        ->type_name("X[,X...]")
+        ->default_str("auto");
+    sweep.iterations = {8};
+    addListOption(command, "--iterations", sweep.iterations, appendIterations, "Turbo iterations, 1 to 15")
+        ->type_name("N[,N...]")
+        ->default_str("8");
+    addListOption(
+        command, "--ebn0", sweep.milliDecibels, appendEbn0, "Eb/N0 in dB; by default where the size's rates fall")
+        ->type_name("START:STEP:STOP|X[,X...]");
+}
+
+void addRuleOptions(CLI::App& command, BerOptions& options)
+{
+    const auto add = [&command](const std::string& name, std::optional<std::uint64_t>& count, const std::string& text) {
+        command.add_option_function<std::string>(name, countInto(name, count), text)->type_name("N");
+    };
+    add("--block-errors", options.blockErrors, "End a point with the block error N (100, if no other error ends it)");
+    add("--bit-errors", options.bitErrors, "End a point with the bit error N");
+    add("--max-blocks", options.maxBlocks, "End a point with the block N (1000000)");
+    command
+        .add_option_function<std::string>(
+            "--max-time",
+            [&options](const std::string& text) { options.maxSeconds = parseSeconds(text); },
+            "End a point after a time, such as 90, 1.5m or 2h; the only rule by which two runs can differ")
+        ->type_name("T");
+    command
+        .add_option_function<std::string>(
+            "--stop-bler",
+            [&options](const std::string& text) { options.stopBler = parseStopBler(text); },
+            "End a curve after the first point with a lower block error rate (0.0001; without end with --ebn0)")
+        ->type_name("RATE");
+    command
+        .add_option_function<std::string>(
+            "--frames",
+            [&options](const std::string& text) { options.frames = parseFrames(text); },
+            "Simulate the blocks FROM to TO - 1 of each point, all of them unless rules are given")
+        ->type_name("FROM:TO");
+    command.add_flag("--each-iteration", options.eachIteration, "Count errors after each iteration");
+    command
+        .add_option_function<std::string>(
+            "--seed",
+            [&options](const std::string& text) {
+                const auto seed = parseInteger<std::uint64_t>(text);
+                if (!seed) {
+                    refuse("--seed", text, "allowed are the integers 0 to 18446744073709551615");
+                }
+                options.seed = *seed;
+            },
+            "What bits and noise follow from")
+        ->type_name("N")
+        ->default_str("1");
+}
+
+void addExecutionOptions(CLI::App& command, BerOptions& options)
+{
+    command.add_option("--threads", options.threads, "Threads, each with a decoder; by default as many as cores")
+        ->transform(integerFrom(1, 1024))
+        ->type_name("N");
+    command
+        .add_option("--instruction-set",
+                    options.instructionSet,
+                    "avx512, avx2, ssse3, generic or component; by default the fastest. All give the same results")
+        ->type_name("NAME");
+    CLI::Option* const output =
+        command.add_option("--output", options.output, "Results, as CSV or JSON by the ending .csv or .json")
+            ->type_name("FILE");
+    command.add_flag("--resume", options.resume, "Go on where the run with the same parameters was stopped")
+        ->needs(output);
+    command.add_flag("--quiet", options.quiet, "Print no table")->needs(output);
+    command
+        .add_option_function<std::string>(
+            "--replay",
+            [&options](const std::string& text) { options.replay = parseReplay(text); },
+            "Write one block's soft values and bits, as 'morvik decode' reads them, and simulate nothing")
+        ->type_name("POINT:FRAME");
+}
+
+// ---- The command that repeats a run
+
+template <class Values, class Text>
+std::string listed(const Values& values, Text textOf)
+{
+    std::string list;
+    for (const auto& value : values) {
+        list += (list.empty() ? "" : ",") + textOf(value);
+    }
+    return list;
+}
+
+/// Holds whatever the results follow from, and nothing else.
+std::string commandOf(const BerOptions& options, const simulation::StopRules& rules)
+{
+    const simulation::Sweep& sweep = options.sweep;
+    const auto number = [](auto value) {
+        return std::to_string(value);
+    };
+    std::string command = "morvik ber";
+    const auto add = [&command](const std::string& option, const std::string& value) {
+        command += ' ' + option + ' ' + value;
+    };
+    add("--block-size", listed(sweep.blockSizes, number));
+    add("--num-pu", listed(sweep.numPus, number));
+    add("--algorithm", listed(sweep.algorithms, simulation::algorithmName));
+    add("--scale", listed(sweep.scaleOptions, simulation::scaleOptionText));
+    add("--iterations", listed(sweep.iterations, number));
+    if (!sweep.milliDecibels.empty()) {
+        add("--ebn0", listed(sweep.milliDecibels, thousandthsText));
+    }
+    const auto addCount = [&](const std::string& option, const std::optional<std::uint64_t>& count) {
+        if (count) {
+            add(option, std::to_string(*count));
+        }
+    };
+    addCount("--block-errors", rules.blockErrors);
+    addCount("--bit-errors", rules.bitErrors);
+    addCount("--max-blocks", rules.maxBlocks);
+    if (rules.maxSeconds) {
+        add("--max-time", realText(*rules.maxSeconds));
+    }
+    add("--stop-bler", realText(rules.stopBler));
+    if (options.frames) {
+        add("--frames", std::to_string(options.frames->from) + ':' + std::to_string(options.frames->to));
+    }
+    command += options.eachIteration ? " --each-iteration" : "";
+    add("--seed", std::to_string(options.seed));
+    return command;
+}
+
+simulation::StopRules rulesOf(const BerOptions& options)
+{
+    simulation::StopRules rules;
+    rules.blockErrors = options.blockErrors;
+    rules.bitErrors = options.bitErrors;
+    rules.maxBlocks = options.maxBlocks;
+    rules.maxSeconds = options.maxSeconds;
+    rules.stopBler = options.stopBler.value_or(0);
+    if (!options.frames) {
+        if (!rules.blockErrors && !rules.bitErrors) {
+            rules.blockErrors = defaultBlockErrors;
+        }
+        rules.maxBlocks = options.maxBlocks.value_or(defaultMaxBlocks);
+        rules.stopBler = options.stopBler.value_or(options.sweep.milliDecibels.empty() ? defaultStopBler : 0);
+    }
+    return rules;
+}
+
+}  // namespace
+
+void addBerOptions(CLI::App& command, BerOptions& options)
+{
+    addSweepOptions(command, options.sweep);
+    addRuleOptions(command, options);
+    addExecutionOptions(command, options);
+}
+
+simulation::Plan planOf(const BerOptions& options)
+{
+    if (options.eachIteration && options.sweep.iterations.size() > 1) {
+        throw simulation::Error("--each-iteration counts up to one number of --iterations, give only the largest");
+    }
+    simulation::Plan plan;
+    plan.points = simulation::pointsOf(options.sweep);
+    plan.eachIteration = options.eachIteration;
+    plan.rules = rulesOf(options);
+    plan.frames = options.frames.value_or(plan.frames);
+    plan.seed = options.seed;
+    plan.version = MORVIK_VERSION;
+    plan.command = commandOf(options, plan.rules);
+    return plan;
+}
+
+}  // namespace morvik

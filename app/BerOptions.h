@@ -1,0 +1,49 @@
+// BerOptions: the arguments of `morvik ber`.
+#ifndef MORVIK_BEROPTIONS_H
+#define MORVIK_BEROPTIONS_H
+
+#include <CLI/CLI.hpp>
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "simulation/Plan.h"
+
+namespace morvik {
+
+/// A frame of a point.
+struct ReplayedFrame {
+    std::size_t point = 0;
+    std::uint64_t frame = 0;
+};
+
+/// What was asked for; nothing stands for a default that depends on other options.
+struct BerOptions {
+    simulation::Sweep sweep;
+    bool eachIteration = false;
+    std::optional<std::uint64_t> blockErrors;
+    std::optional<std::uint64_t> bitErrors;
+    std::optional<std::uint64_t> maxBlocks;
+    std::optional<double> maxSeconds;
+    std::optional<double> stopBler;
+    std::optional<simulation::FrameRange> frames;
+    std::uint64_t seed = 1;
+
+    std::uint32_t threads = 0;  // 0 for all cores
+    std::string instructionSet;
+    std::string output;
+    bool resume = false;
+    bool quiet = false;
+    std::optional<ReplayedFrame> replay;
+};
+
+/// Adds the options, which fill in `options`.
+void addBerOptions(CLI::App& command, BerOptions& options);
+
+/// The plan that the options ask for, with all defaults.
+simulation::Plan planOf(const BerOptions& options);
+
+}  // namespace morvik
+
+#endif

@@ -1,0 +1,51 @@
+// Lists: option values with commas between them.
+#ifndef MORVIK_LISTS_H
+#define MORVIK_LISTS_H
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "Text.h"
+
+namespace morvik {
+
+/// The texts between the separators, at least one.
+inline std::vector<std::string> splitAt(char separator, std::string_view text)
+{
+    std::vector<std::string> parts;
+    for (std::size_t end = text.find(separator); end != std::string_view::npos; end = text.find(separator)) {
+        parts.emplace_back(text.substr(0, end));
+        text.remove_prefix(end + 1);
+    }
+    parts.emplace_back(text);
+    return parts;
+}
+
+/// Adds an option that takes a list. `append` puts what one text between the commas stands for behind the values; when
+/// it cannot, it throws CLI::ValidationError, as does a value that comes twice. Values end up in ascending order.
+template <class Value, class Append>
+CLI::Option* addListOption(CLI::App& command,
+                           const std::string& name,
+                           std::vector<Value>& values,
+                           Append append,
+                           const std::string& description)
+{
+    const auto take = [name, &values, append](const std::string& text) {
+        values.clear();
+        for (const std::string& part : splitAt(',', text)) {
+            append(part, values);
+            std::sort(values.begin(), values.end());
+            if (std::adjacent_find(values.begin(), values.end()) != values.end()) {
+                throw CLI::ValidationError(name, shown(part) + " is not allowed, it has been given before");
+            }
+        }
+    };
+    return command.add_option_function<std::string>(name, take, description);
+}
+
+}  // namespace morvik
+
+#endif

@@ -1,0 +1,67 @@
+// Merge: the subcommand that joins the results of several runs.
+#include "Merge.h"
+
+#include <iostream>
+#include <memory>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "simulation/Merge.h"
+#include "simulation/ResultFiles.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::vector<std::string> inputs;
+    std::string output;
+};
+
+int merge(const Options& options)
+{
+    std::vector<simulation::Part> parts;
+    for (const std::string& input : options.inputs) {
+        parts.push_back({input, simulation::readResults(input)});
+    }
+    const simulation::Results results = simulation::merge(parts);
+    if (options.output.empty()) {
+        if (!(std::cout << simulation::csvText(results) << std::flush)) {
+            throw std::runtime_error("<stdout>: cannot be written");
+        }
+        return success;
+    }
+    simulation::writeResults(options.output, results);
+    return success;
+}
+
+/// The end of the help text.
+constexpr char explanation[] = R"(
+The runs have the same seed and were made by the same version. Rows of the same parameters
+become one, if they have no frames in common: 'morvik ber --frames' divides them.
+
+Example: two halves of a simulation, made anywhere
+  morvik ber --block-size 512 --ebn0 1.4 --frames 0:500000 --output a.csv
+  morvik ber --block-size 512 --ebn0 1.4 --frames 500000:1000000 --output b.csv
+  morvik merge a.csv b.csv --output k512.csv)";
+
+}  // namespace
+
+Command addMerge(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("merge", "Join the results of 'morvik ber' for different frames");
+    const auto options = std::make_shared<Options>();
+    command->add_option("FILE", options->inputs, "Results, as CSV or JSON")->required()->type_name("");
+    command
+        ->add_option(
+            "--output", options->output, "File for all of them, .csv or .json; by default CSV on standard output")
+        ->type_name("FILE");
+    command->footer(explanation);
+    const auto run = [options] {
+        return merge(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik

@@ -1,0 +1,14 @@
+// Merge: the subcommand that joins the results of several runs.
+#ifndef MORVIK_MERGE_H
+#define MORVIK_MERGE_H
+
+#include "Command.h"
+
+namespace morvik {
+
+/// Adds `merge` to the command line.
+Command addMerge(CLI::App& app);
+
+}  // namespace morvik
+
+#endif

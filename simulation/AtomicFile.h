@@ -1,0 +1,18 @@
+// AtomicFile: files that are there as a whole, in their old or their new content, whenever the machine stops.
+#ifndef MORVIK_SIMULATION_ATOMICFILE_H
+#define MORVIK_SIMULATION_ATOMICFILE_H
+
+#include <string>
+
+namespace simulation {
+
+/// Replaces the content of a file, or makes it: written beside it, flushed to the disk, and given its name. When that
+/// fails, the old content stays and nothing else is left. A symbolic link is followed. Throws Error.
+void writeAtomically(const std::string& fileName, const std::string& content);
+
+/// Throws Error unless writeAtomically can be expected to work.
+void checkWritable(const std::string& fileName);
+
+}  // namespace simulation
+
+#endif

@@ -1,0 +1,180 @@
+// Columns: the columns of result files, and how a row is written into them and read back.
+#include "Columns.h"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <cstdint>
+#include <optional>
+#include <system_error>
+
+#include "Confidence.h"
+#include "Thousandths.h"
+#include "standard/BlockSizes.h"
+
+namespace simulation {
+
+namespace {
+
+/// Locales have no say in the numbers.
+template <class... Format>
+std::string numberText(double value, Format... format)
+{
+    std::array<char, 400> text = {};  // more than any double takes with three decimals
+    const auto result = std::to_chars(text.data(), text.data() + text.size(), value, format...);
+    return std::string(text.data(), result.ptr);
+}
+
+std::string rateText(double rate)
+{
+    return numberText(rate, std::chars_format::scientific, 6);
+}
+
+Bounds bitBounds(const ResultRow& row)
+{
+    return bitErrorBounds(row.errors, row.frames.size(), row.point.blockSize);
+}
+
+Bounds blockBounds(const ResultRow& row)
+{
+    return blockErrorBounds(row.errors, row.frames.size());
+}
+
+template <class Number>
+bool readNumber(std::string_view text, Number& value)
+{
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value);
+    return result.ec == std::errc() && result.ptr == end;
+}
+
+template <class Value>
+bool readInto(const std::optional<Value>& parsed, Value& value)
+{
+    value = parsed.value_or(value);
+    return parsed.has_value();
+}
+
+bool readBlockSize(std::string_view text, ResultRow& row)
+{
+    return readNumber(text, row.point.blockSize) && standard::findBlockSize(row.point.blockSize) != nullptr;
+}
+
+bool readScaleOption(std::string_view text, ResultRow& row)
+{
+    row.point.scaleOption = parseThousandths(text);
+    return text == "auto" || row.point.scaleOption;
+}
+
+bool readSeconds(std::string_view text, ResultRow& row)
+{
+    return readNumber(text, row.seconds) && row.seconds >= 0;
+}
+
+std::string failuresText(const ResultRow& row)
+{
+    std::string text;
+    for (const std::uint64_t frame : row.errors.failures) {
+        text += (text.empty() ? "" : " ") + std::to_string(frame);
+    }
+    return text;
+}
+
+bool readFailures(std::string_view text, ResultRow& row)
+{
+    row.errors.failures.clear();
+    while (!text.empty()) {
+        const std::string_view first = text.substr(0, text.find(' '));
+        std::uint64_t frame = 0;
+        if (!readNumber(first, frame)) {
+            return false;
+        }
+        row.errors.failures.push_back(frame);
+        text.remove_prefix(std::min(first.size() + 1, text.size()));
+    }
+    return row.errors.failures.size() <= ErrorCounts::keptFailures;
+}
+
+bool skip(std::string_view, ResultRow&)
+{
+    return true;
+}
+
+using Row = ResultRow;
+using Text = std::string_view;
+constexpr auto number = Column::Kind::number;
+constexpr auto text = Column::Kind::text;
+constexpr auto list = Column::Kind::list;
+
+// clang-format off
+const std::vector<Column> allColumns = {
+    {"point", number,
+     [](const Row& row) { return std::to_string(row.pointNumber); },
+     [](Text field, Row& row) { return readNumber(field, row.pointNumber); }},
+    {"block_size", number,
+     [](const Row& row) { return std::to_string(row.point.blockSize); },
+     readBlockSize},
+    {"num_pu", number,
+     [](const Row& row) { return std::to_string(row.point.numPu); },
+     [](Text field, Row& row) { return readNumber(field, row.point.numPu); }},
+    {"algorithm", text,
+     [](const Row& row) { return algorithmName(row.point.algorithm); },
+     [](Text field, Row& row) { return readInto(algorithmOf(field), row.point.algorithm); }},
+    {"scale_option", text,
+     [](const Row& row) { return scaleOptionText(row.point.scaleOption); },
+     readScaleOption},
+    {"iterations", number,
+     [](const Row& row) { return std::to_string(row.point.iterations); },
+     [](Text field, Row& row) { return readNumber(field, row.point.iterations); }},
+    {"ebn0_db", number,
+     [](const Row& row) { return thousandthsText(row.point.milliDecibels); },
+     [](Text field, Row& row) { return readInto(parseThousandths(field), row.point.milliDecibels); }},
+    {"scale", number,
+     [](const Row& row) { return thousandthsText(row.point.milliScale); },
+     [](Text field, Row& row) { return readInto(parseThousandths(field), row.point.milliScale); }},
+    {"frames", text,
+     [](const Row& row) { return row.frames.text(); },
+     [](Text field, Row& row) { return readInto(FrameSet::parse(field), row.frames) && row.frames.size() > 0; }},
+    {"blocks", number,
+     [](const Row& row) { return std::to_string(row.frames.size()); },
+     skip},
+    {"bit_errors", number,
+     [](const Row& row) { return std::to_string(row.errors.bitErrors); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.bitErrors); }},
+    {"block_errors", number,
+     [](const Row& row) { return std::to_string(row.errors.blockErrors); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.blockErrors); }},
+    {"bit_error_squares", number,
+     [](const Row& row) { return std::to_string(row.errors.bitErrorSquares); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.bitErrorSquares); }},
+    {"ber", number, [](const Row& row) { return rateText(bitErrorRate(row)); }, skip},
+    {"ber_low", number, [](const Row& row) { return rateText(bitBounds(row).low); }, skip},
+    {"ber_high", number, [](const Row& row) { return rateText(bitBounds(row).high); }, skip},
+    {"bler", number, [](const Row& row) { return rateText(blockErrorRate(row)); }, skip},
+    {"bler_low", number, [](const Row& row) { return rateText(blockBounds(row).low); }, skip},
+    {"bler_high", number, [](const Row& row) { return rateText(blockBounds(row).high); }, skip},
+    {"clipped_values", number,
+     [](const Row& row) { return std::to_string(row.clipped); },
+     [](Text field, Row& row) { return readNumber(field, row.clipped); }},
+    {"clipped_fraction", number, [](const Row& row) { return rateText(clippedFraction(row)); }, skip},
+    {"failed_frames", list, failuresText, readFailures},
+    {"seconds", number,
+     [](const Row& row) { return numberText(row.seconds, std::chars_format::fixed, 3); },
+     readSeconds},
+    {"seed", number,
+     [](const Row& row) { return std::to_string(row.seed); },
+     [](Text field, Row& row) { return readNumber(field, row.seed); }},
+    {"version", text,
+     [](const Row& row) { return row.version; },
+     [](Text field, Row& row) { row.version = field; return !field.empty(); }},
+};
+// clang-format on
+
+}  // namespace
+
+const std::vector<Column>& columns()
+{
+    return allColumns;
+}
+
+}  // namespace simulation

@@ -1,0 +1,125 @@
+// FrameSimulator: one thread's way from frame numbers to wrong bits: frames are made, decoded and compared.
+#include "FrameSimulator.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <utility>
+
+#include "Thousandths.h"
+
+namespace simulation {
+
+namespace {
+
+/// Frames to decode at a time: the soft values and bits of as many stay in the second level of the cache, and at
+/// least as many as the encoder and the decoder take at once.
+std::uint32_t framesAtOnce(unsigned blockSize)
+{
+    return std::max(16384 / blockSize, 1U) * 64;
+}
+
+}  // namespace
+
+FrameSimulator::FrameSimulator(const Plan& plan, std::string instructionSet)
+    : itsPlan(plan), itsInstructionSet(std::move(instructionSet))
+{
+}
+
+BatchResult FrameSimulator::begin(const FrameBatch& batch) const
+{
+    BatchResult result;
+    result.batch = batch;
+    result.wrongBits.reserve(batch.count * itsPlan.countsOf(itsPlan.points[batch.point]));
+    result.clipped.reserve(batch.count);
+    return result;
+}
+
+bool FrameSimulator::proceed(BatchResult& result)
+{
+    const auto done = static_cast<std::uint32_t>(result.clipped.size());
+    if (done == result.batch.count) {
+        return false;
+    }
+    prepareFor(result.batch.point);
+    const unsigned K = itsPlan.points[result.batch.point].blockSize;
+    const std::uint32_t count = std::min(framesAtOnce(K), result.batch.count - done);
+    itsSource->make(result.batch.first + done, count, itsFrames);
+    appendWrongBits(result.batch.point, count, result.wrongBits);
+    result.clipped.insert(result.clipped.end(), itsFrames.clipped.begin(), itsFrames.clipped.end());
+    return true;
+}
+
+const morvik::link::Frames& FrameSimulator::frames() const
+{
+    return itsFrames;
+}
+
+void FrameSimulator::prepareFor(std::size_t number)
+{
+    if (itsPoint == number) {
+        return;
+    }
+    const Point& point = itsPlan.points[number];
+    if (!itsPoint || point.numPu != itsPlan.points[*itsPoint].numPu ||
+        point.algorithm != itsPlan.points[*itsPoint].algorithm) {
+        makeDecoder(point);
+    }
+    itsSource.emplace(point.blockSize, point.milliDecibels, fromThousandths(point.milliScale), itsPlan.seed);
+    itsPoint = number;
+}
+
+void FrameSimulator::makeDecoder(const Point& point)
+{
+    veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
+    generics.C_NUM_PU = static_cast<std::int32_t>(point.numPu);
+    generics.C_ALGORITHM_TYPE = static_cast<std::int32_t>(point.algorithm);
+    itsDecoder.reset(veltra_ip_morvik_v1_0_create_state(generics));
+    const bool isMade =
+        itsDecoder && (itsInstructionSet.empty() ||
+                       veltra_ip_morvik_v1_0_set_instruction_set(itsDecoder.get(), itsInstructionSet.c_str()) == 0);
+    if (!isMade) {
+        throw std::runtime_error("the decoder cannot be made");
+    }
+}
+
+void FrameSimulator::appendWrongBits(std::size_t number, std::uint32_t count, std::vector<std::uint32_t>& wrongBits)
+{
+    const Point& point = itsPlan.points[number];
+    const std::size_t counts = itsPlan.countsOf(point);
+    const std::size_t start = wrongBits.size();
+    wrongBits.resize(start + count * counts);
+    for (std::size_t i = 0; i < counts; ++i) {
+        decode(point, point.iterations - static_cast<unsigned>(counts - 1 - i), count);
+        for (std::uint32_t frame = 0; frame < count; ++frame) {
+            const auto* const sent = &itsFrames.sent[std::size_t{frame} * point.blockSize];
+            const auto* const decided = &itsDecided[std::size_t{frame} * point.blockSize];
+            std::uint32_t wrong = 0;
+            for (unsigned bit = 0; bit < point.blockSize; ++bit) {
+                wrong += sent[bit] ^ decided[bit];
+            }
+            wrongBits[start + frame * counts + i] = wrong;
+        }
+    }
+}
+
+void FrameSimulator::decode(const Point& point, unsigned iterations, std::uint32_t count)
+{
+    itsDecided.resize(std::size_t{count} * point.blockSize);
+    veltra_ip_morvik_v1_0_batch_outputs outputs = {};
+    outputs.dout = itsDecided.data();
+    outputs.dout_alloc = itsDecided.size();
+    const std::int32_t status = veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.get(),
+                                                                        itsFrames.streams[0].data(),
+                                                                        itsFrames.streams[1].data(),
+                                                                        itsFrames.streams[2].data(),
+                                                                        static_cast<std::int32_t>(point.blockSize + 4),
+                                                                        count,
+                                                                        iterations,
+                                                                        nullptr,
+                                                                        &outputs);
+    if (status != 0) {
+        throw std::runtime_error("the decoder has refused a block");
+    }
+}
+
+}  // namespace simulation

@@ -1,0 +1,59 @@
+// FrameSimulator: one thread's way from frame numbers to wrong bits: frames are made, decoded and compared.
+#ifndef MORVIK_SIMULATION_FRAMESIMULATOR_H
+#define MORVIK_SIMULATION_FRAMESIMULATOR_H
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Plan.h"
+#include "Workers.h"
+#include "link/FrameSource.h"
+#include "morvik_v1_0_batch.h"
+
+namespace simulation {
+
+/// Makes the frames of a plan's points and decodes them. Belongs to one thread.
+class FrameSimulator {
+public:
+    /// The plan outlives the simulator. An empty instruction set leaves the choice to the decoder, which gives the
+    /// same bits with each.
+    FrameSimulator(const Plan& plan, std::string instructionSet);
+
+    /// An empty result for the batch.
+    BatchResult begin(const FrameBatch& batch) const;
+
+    /// Simulates the next frames of the batch, as many as are best decoded at a time, and adds them to the result;
+    /// false if there are none.
+    bool proceed(BatchResult& result);
+
+    /// The frames that were simulated last.
+    const morvik::link::Frames& frames() const;
+
+private:
+    struct DestroyState {
+        void operator()(veltra_ip_morvik_v1_0_state* state) const
+        {
+            veltra_ip_morvik_v1_0_destroy_state(state);
+        }
+    };
+
+    void prepareFor(std::size_t point);
+    void makeDecoder(const Point& point);
+    void appendWrongBits(std::size_t point, std::uint32_t count, std::vector<std::uint32_t>& wrongBits);
+    void decode(const Point& point, unsigned iterations, std::uint32_t count);
+
+    const Plan& itsPlan;
+    std::string itsInstructionSet;
+    std::optional<std::size_t> itsPoint;
+    std::unique_ptr<veltra_ip_morvik_v1_0_state, DestroyState> itsDecoder;
+    std::optional<morvik::link::FrameSource> itsSource;
+    morvik::link::Frames itsFrames;
+    std::vector<std::uint8_t> itsDecided;
+};
+
+}  // namespace simulation
+
+#endif

@@ -1,0 +1,103 @@
+// Frames: ranges of frame numbers. A frame is one block of a run, and everything random about it follows from its
+// number.
+#include "Frames.h"
+
+#include <algorithm>
+#include <charconv>
+#include <numeric>
+#include <system_error>
+
+namespace simulation {
+
+namespace {
+
+std::optional<std::uint64_t> parseNumber(std::string_view text)
+{
+    std::uint64_t value = 0;
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value);
+    if (result.ec != std::errc() || result.ptr != end) {
+        return std::nullopt;
+    }
+    return value;
+}
+
+}  // namespace
+
+std::optional<FrameRange> parseFrameRange(std::string_view text)
+{
+    const std::size_t colon = text.find(':');
+    if (colon == std::string_view::npos) {
+        return std::nullopt;
+    }
+    const auto from = parseNumber(text.substr(0, colon));
+    const auto to = parseNumber(text.substr(colon + 1));
+    if (!from || !to || *from >= *to) {
+        return std::nullopt;
+    }
+    return FrameRange{*from, *to};
+}
+
+FrameSet::FrameSet(FrameRange range)
+{
+    if (range.from < range.to) {
+        itsRanges.push_back(range);
+    }
+}
+
+bool FrameSet::join(const FrameSet& other)
+{
+    std::vector<FrameRange> all = itsRanges;
+    all.insert(all.end(), other.itsRanges.begin(), other.itsRanges.end());
+    std::sort(all.begin(), all.end(), [](const FrameRange& a, const FrameRange& b) { return a.from < b.from; });
+    std::vector<FrameRange> joined;
+    for (const FrameRange& range : all) {
+        if (joined.empty() || joined.back().to < range.from) {
+            joined.push_back(range);
+        } else if (joined.back().to == range.from) {
+            joined.back().to = range.to;
+        } else {
+            return false;
+        }
+    }
+    itsRanges = joined;
+    return true;
+}
+
+std::uint64_t FrameSet::size() const
+{
+    return std::accumulate(
+        itsRanges.begin(), itsRanges.end(), std::uint64_t{0}, [](std::uint64_t sum, const FrameRange& range) {
+            return sum + (range.to - range.from);
+        });
+}
+
+const std::vector<FrameRange>& FrameSet::ranges() const
+{
+    return itsRanges;
+}
+
+std::string FrameSet::text() const
+{
+    std::string text;
+    for (const FrameRange& range : itsRanges) {
+        text += (text.empty() ? "" : " ") + std::to_string(range.from) + ':' + std::to_string(range.to);
+    }
+    return text;
+}
+
+std::optional<FrameSet> FrameSet::parse(std::string_view text)
+{
+    FrameSet frames;
+    while (!text.empty()) {
+        const std::string_view first = text.substr(0, text.find(' '));
+        const auto range = parseFrameRange(first);
+        if (!range || !frames.join(FrameSet(*range))) {
+            return std::nullopt;
+        }
+        text.remove_prefix(std::min(first.size() + 1, text.size()));
+    }
+    return frames;
+}
+
+}  // namespace simulation

@@ -1,0 +1,111 @@
+// Journal: what a run has counted, kept in memory and on the disk.
+#include "Journal.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <filesystem>
+#include <utility>
+
+#include "AtomicFile.h"
+#include "Error.h"
+#include "ResultFiles.h"
+#include "TextFile.h"
+
+namespace simulation {
+
+Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
+    : itsPlan(plan), itsOutput(std::move(output)), itsCheckpoint{plan.version, plan.command, {}, {}}
+{
+    if (itsOutput.empty()) {
+        return;
+    }
+    formatOf(itsOutput);
+    checkWritable(itsOutput);
+    readCheckpoint(earlier);
+    writeCheckpoint();
+}
+
+bool Journal::isResumed() const
+{
+    return itsIsResumed;
+}
+
+const std::vector<PointResult>& Journal::ended() const
+{
+    return itsCheckpoint.ended;
+}
+
+PointResult Journal::resultSoFar(std::size_t point) const
+{
+    if (itsCheckpoint.running && itsCheckpoint.running->number == point) {
+        return *itsCheckpoint.running;
+    }
+    return {point, Tally(itsPlan.countsOf(itsPlan.points[point])), 0};
+}
+
+void Journal::keep(const PointResult& running)
+{
+    itsCheckpoint.running = running;
+    writeCheckpoint();
+}
+
+void Journal::end(const PointResult& point)
+{
+    itsCheckpoint.ended.push_back(point);
+    itsCheckpoint.running.reset();
+    writeCheckpoint();
+    writeResults();
+}
+
+void Journal::complete()
+{
+    writeResults();  // once more, for a run that was killed between the last two files
+    if (!itsOutput.empty() && unlink(checkpointName().c_str()) != 0) {
+        throw fileError(checkpointName(), "removed");
+    }
+}
+
+std::string Journal::checkpointName() const
+{
+    return itsOutput + ".checkpoint";
+}
+
+void Journal::readCheckpoint(Earlier earlier)
+{
+    const std::string name = checkpointName();
+    if (!std::filesystem::exists(name)) {
+        return;
+    }
+    if (earlier == Earlier::refuse) {
+        throw Error(name + ": holds an unfinished run; go on with it by --resume, or remove it");
+    }
+    const auto checkpoint = parseCheckpoint(readText(name));
+    if (!checkpoint) {
+        throw Error(name + ": is damaged and cannot be resumed; remove it to start anew");
+    }
+    if (checkpoint->version != itsPlan.version) {
+        throw Error(name + ": holds a run of version " + checkpoint->version + ", this is " + itsPlan.version);
+    }
+    if (checkpoint->command != itsPlan.command) {
+        throw Error(name + ": holds a run with other parameters: " + checkpoint->command);
+    }
+    itsCheckpoint = *checkpoint;
+    itsIsResumed = true;
+}
+
+void Journal::writeCheckpoint() const
+{
+    if (!itsOutput.empty()) {
+        writeAtomically(checkpointName(), checkpointText(itsCheckpoint));
+    }
+}
+
+void Journal::writeResults() const
+{
+    if (!itsOutput.empty()) {
+        simulation::writeResults(itsOutput, resultsOf(itsPlan, itsCheckpoint.ended));
+    }
+}
+
+}  // namespace simulation

@@ -1,0 +1,25 @@
+// Merge: the results of several runs, joined.
+#ifndef MORVIK_SIMULATION_MERGE_H
+#define MORVIK_SIMULATION_MERGE_H
+
+#include <string>
+#include <vector>
+
+#include "Results.h"
+
+namespace simulation {
+
+/// The results of a file.
+struct Part {
+    std::string fileName;
+    Results results;
+};
+
+/// Joins results of disjoint frames: rows of the same parameters become one, with the counts of all of them. The
+/// order of the parts does not matter. Points keep their numbers where these are still good names, and get new ones
+/// otherwise. Throws Error when parts have frames in common, or differ in what all results of a run share.
+Results merge(const std::vector<Part>& parts);
+
+}  // namespace simulation
+
+#endif

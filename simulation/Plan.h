@@ -1,0 +1,66 @@
+// Plan: the points of a sweep, and how long each is simulated.
+#ifndef MORVIK_SIMULATION_PLAN_H
+#define MORVIK_SIMULATION_PLAN_H
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "Frames.h"
+#include "Point.h"
+#include "Results.h"
+#include "StopRules.h"
+#include "Tally.h"
+
+namespace simulation {
+
+/// Values for each parameter, every combination of which is a point.
+struct Sweep {
+    std::vector<unsigned> blockSizes;
+    std::vector<unsigned> numPus;
+    std::vector<unsigned> algorithms;
+    std::vector<ScaleOption> scaleOptions;
+    std::vector<unsigned> iterations;
+    std::vector<int> milliDecibels;  // if empty, a range that suits the block size
+};
+
+/// The Eb/N0 in which the error rates of blocks of K bits fall, in thousandths of a decibel.
+std::vector<int> usualMilliDecibels(unsigned K);
+
+/// The points in the order of results.
+std::vector<Point> pointsOf(const Sweep& sweep);
+
+/// All that the results of a run follow from.
+struct Plan {
+    std::vector<Point> points;
+    bool eachIteration = false;  // looks at the decisions after each iteration, up to the point's
+    StopRules rules;
+    FrameRange frames = {0, UINT64_MAX};
+    std::uint64_t seed = 0;
+    std::string version;
+    std::string command;  // repeats the run; two plans are the same if their commands and versions are
+
+    /// How many counts of iterations are looked at in a point.
+    std::size_t countsOf(const Point& point) const
+    {
+        return eachIteration ? point.iterations : 1;
+    }
+};
+
+/// What has been counted at a point of a plan.
+struct PointResult {
+    std::size_t number = 0;
+    Tally tally;
+    double seconds = 0;
+};
+
+/// Whether an earlier point of the curve has a block error rate below the one that ends curves.
+bool isCurveEnded(const Plan& plan, std::size_t point, const std::vector<PointResult>& earlier);
+
+/// The rows of all points.
+Results resultsOf(const Plan& plan, const std::vector<PointResult>& points);
+
+}  // namespace simulation
+
+#endif

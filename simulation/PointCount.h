@@ -1,0 +1,41 @@
+// PointCount: the counting of a point's frames in the order of their numbers, in whatever order their results come.
+#ifndef MORVIK_SIMULATION_POINTCOUNT_H
+#define MORVIK_SIMULATION_POINTCOUNT_H
+
+#include <cstdint>
+#include <map>
+
+#include "Frames.h"
+#include "StopRules.h"
+#include "Tally.h"
+#include "Workers.h"
+
+namespace simulation {
+
+/// Counts frames until a rule ends the point or the frames do. Results of later frames wait for those before them.
+class PointCount {
+public:
+    /// Goes on from a tally of the first frames of `frames`. The rules outlive the count.
+    PointCount(const StopRules& rules, FrameRange frames, Tally tally);
+
+    /// Takes the result of a batch. Batches do not overlap.
+    void take(BatchResult result);
+
+    /// Whether the last frame that counts has been counted.
+    bool isComplete() const;
+
+    const Tally& tally() const;
+
+private:
+    void countInOrder(const BatchResult& result);
+
+    const StopRules& itsRules;
+    FrameRange itsFrames;
+    Tally itsTally;
+    std::map<std::uint64_t, BatchResult> itsWaiting;  // by their first frames
+    bool itsIsComplete;
+};
+
+}  // namespace simulation
+
+#endif

@@ -1,0 +1,25 @@
+// Replay: one frame of a run once more, to be looked at.
+#ifndef MORVIK_SIMULATION_REPLAY_H
+#define MORVIK_SIMULATION_REPLAY_H
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+
+#include "Plan.h"
+
+namespace simulation {
+
+/// A frame as texts in the formats of `morvik decode`.
+struct ReplayedTexts {
+    std::string softValues;
+    std::string sentBits;
+    std::uint32_t wrongBits = 0;  // that the decoder of the point leaves
+};
+
+/// Makes the frame of the point and decodes it. For the instruction set, see FrameSimulator.
+ReplayedTexts replay(const Plan& plan, std::size_t point, std::uint64_t frame, const std::string& instructionSet);
+
+}  // namespace simulation
+
+#endif

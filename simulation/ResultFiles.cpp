@@ -1,0 +1,195 @@
+// ResultFiles: results as CSV and JSON.
+#include "ResultFiles.h"
+
+#include <algorithm>
+#include <nlohmann/json.hpp>
+#include <sstream>
+#include <string_view>
+#include <vector>
+
+#include "AtomicFile.h"
+#include "Columns.h"
+#include "Error.h"
+#include "TextFile.h"
+
+namespace simulation {
+
+namespace {
+
+bool endsIn(std::string_view text, std::string_view end)
+{
+    return text.size() > end.size() && text.substr(text.size() - end.size()) == end;
+}
+
+std::string headerLine()
+{
+    std::string line;
+    for (const Column& column : columns()) {
+        line += (line.empty() ? "" : ",") + std::string(column.name);
+    }
+    return line;
+}
+
+/// Puts the text into the row. Throws Error, which opens with `place`.
+void readField(const Column& column, const std::string& text, ResultRow& row, const std::string& place)
+{
+    if (!column.read(text, row)) {
+        throw Error(place + ": " + std::string(column.name) + " \"" + text.substr(0, 40) + "\" is not allowed");
+    }
+}
+
+std::vector<std::string> splitAt(char separator, const std::string& line)
+{
+    std::vector<std::string> fields(1);
+    for (const char c : line) {
+        if (c == separator) {
+            fields.emplace_back();
+        } else {
+            fields.back() += c;
+        }
+    }
+    return fields;
+}
+
+ResultRow csvRow(const std::string& line, const std::string& place)
+{
+    const std::vector<std::string> fields = splitAt(',', line);
+    if (fields.size() != columns().size()) {
+        throw Error(place + ": " + std::to_string(fields.size()) + " fields, expected " +
+                    std::to_string(columns().size()));
+    }
+    ResultRow row;
+    for (std::size_t i = 0; i < fields.size(); ++i) {
+        readField(columns()[i], fields[i], row, place);
+    }
+    return row;
+}
+
+Results parseCsv(const std::string& text, const std::string& fileName)
+{
+    std::istringstream lines(text);
+    std::string line;
+    if (!std::getline(lines, line) || line != headerLine()) {
+        throw Error(fileName + ":1: no header of a result file, expected \"" + headerLine() + '"');
+    }
+    Results results;
+    for (std::size_t number = 2; std::getline(lines, line); ++number) {
+        results.rows.push_back(csvRow(line, fileName + ':' + std::to_string(number)));
+    }
+    return results;
+}
+
+/// A row's value as the text of its column.
+std::string jsonField(const nlohmann::json& value, Column::Kind kind)
+{
+    if (kind == Column::Kind::text) {
+        return value.get<std::string>();
+    }
+    if (kind == Column::Kind::number) {
+        return value.is_number() ? value.dump() : "";
+    }
+    std::string text;
+    for (const auto& element : value) {
+        text += (text.empty() ? "" : " ") + element.dump();
+    }
+    return text;
+}
+
+Results parseJson(const std::string& text, const std::string& fileName)
+{
+    Results results;
+    try {
+        const auto json = nlohmann::json::parse(text);
+        results.version = json.at("version").get<std::string>();
+        results.command = json.at("command").get<std::string>();
+        for (const auto& object : json.at("rows")) {
+            const std::string place = fileName + ": row " + std::to_string(results.rows.size() + 1);
+            ResultRow row;
+            for (const Column& column : columns()) {
+                readField(column, jsonField(object.at(std::string(column.name)), column.kind), row, place);
+            }
+            results.rows.push_back(row);
+        }
+    } catch (const nlohmann::json::exception& error) {
+        throw Error(fileName + ": is no result file (" + error.what() + ')');
+    }
+    return results;
+}
+
+std::string jsonString(const std::string& text)
+{
+    return nlohmann::json(text).dump();
+}
+
+std::string jsonValue(const Column& column, const ResultRow& row)
+{
+    std::string text = column.write(row);
+    switch (column.kind) {
+    case Column::Kind::number:
+        return text;
+    case Column::Kind::text:
+        return jsonString(text);
+    case Column::Kind::list:
+        std::replace(text.begin(), text.end(), ' ', ',');
+        return '[' + text + ']';
+    }
+    return {};
+}
+
+}  // namespace
+
+ResultFormat formatOf(const std::string& fileName)
+{
+    if (endsIn(fileName, ".csv")) {
+        return ResultFormat::csv;
+    }
+    if (endsIn(fileName, ".json")) {
+        return ResultFormat::json;
+    }
+    throw Error(fileName + ": is no name for results, allowed are names that end in .csv or .json");
+}
+
+std::string csvText(const Results& results)
+{
+    std::string text = headerLine() + '\n';
+    for (const ResultRow& row : results.rows) {
+        std::string line;
+        for (const Column& column : columns()) {
+            line += (line.empty() ? "" : ",") + column.write(row);
+        }
+        text += line + '\n';
+    }
+    return text;
+}
+
+std::string jsonText(const Results& results)
+{
+    std::string text = "{\n  \"version\": " + jsonString(results.version) +
+                       ",\n  \"command\": " + jsonString(results.command) + ",\n  \"rows\": [";
+    const char* separator = "\n";
+    for (const ResultRow& row : results.rows) {
+        std::string object;
+        for (const Column& column : columns()) {
+            object +=
+                (object.empty() ? "" : ", ") + jsonString(std::string(column.name)) + ": " + jsonValue(column, row);
+        }
+        text += separator + ("    {" + object + '}');
+        separator = ",\n";
+    }
+    return text + "\n  ]\n}\n";
+}
+
+void writeResults(const std::string& fileName, const Results& results)
+{
+    const bool isCsv = formatOf(fileName) == ResultFormat::csv;
+    writeAtomically(fileName, isCsv ? csvText(results) : jsonText(results));
+}
+
+Results readResults(const std::string& fileName)
+{
+    const ResultFormat format = formatOf(fileName);
+    const std::string text = readText(fileName);
+    return format == ResultFormat::csv ? parseCsv(text, fileName) : parseJson(text, fileName);
+}
+
+}  // namespace simulation

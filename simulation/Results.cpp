@@ -1,0 +1,30 @@
+// Results: rows of result files, one for each point, and for each count of iterations that was looked at there.
+#include "Results.h"
+
+namespace simulation {
+
+namespace {
+
+double share(std::uint64_t count, std::uint64_t of)
+{
+    return of > 0 ? static_cast<double>(count) / static_cast<double>(of) : 0;
+}
+
+}  // namespace
+
+double bitErrorRate(const ResultRow& row)
+{
+    return share(row.errors.bitErrors, row.frames.size() * row.point.blockSize);
+}
+
+double blockErrorRate(const ResultRow& row)
+{
+    return share(row.errors.blockErrors, row.frames.size());
+}
+
+double clippedFraction(const ResultRow& row)
+{
+    return share(row.clipped, row.frames.size() * 3 * (row.point.blockSize + 4));
+}
+
+}  // namespace simulation

@@ -1,0 +1,42 @@
+// Results: rows of result files, one for each point, and for each count of iterations that was looked at there.
+#ifndef MORVIK_SIMULATION_RESULTS_H
+#define MORVIK_SIMULATION_RESULTS_H
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "Frames.h"
+#include "Point.h"
+#include "Tally.h"
+
+namespace simulation {
+
+/// A row. Rates and bounds follow from its counts.
+struct ResultRow {
+    std::size_t pointNumber = 0;
+    Point point;
+    FrameSet frames;  // that were counted
+    ErrorCounts errors;
+    std::uint64_t clipped = 0;
+    double seconds = 0;
+    std::uint64_t seed = 0;
+    std::string version;
+};
+
+/// What a result file holds. Rows are in the order of their points.
+struct Results {
+    std::string version;  // of the program that wrote them
+    std::string command;  // that repeats the run
+    std::vector<ResultRow> rows;
+};
+
+/// The rates of a row.
+double bitErrorRate(const ResultRow& row);
+double blockErrorRate(const ResultRow& row);
+double clippedFraction(const ResultRow& row);
+
+}  // namespace simulation
+
+#endif

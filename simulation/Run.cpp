@@ -1,0 +1,159 @@
+// Run: simulates the points of a plan.
+#include "Run.h"
+
+#include <algorithm>
+#include <chrono>
+#include <cstdint>
+
+#include "PointCount.h"
+
+namespace simulation {
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+constexpr std::chrono::milliseconds patience(100);
+constexpr std::chrono::seconds checkpointInterval(3);
+
+/// Batches for each worker that are handed out at a time, so that it need not wait for the next.
+constexpr unsigned batchesAhead = 4;
+
+/// Batches for each worker by which the count of the frames may lag behind: what the results that wait for a slow
+/// worker's may take of the memory.
+constexpr unsigned batchesWaiting = 64;
+
+/// A batch takes some milliseconds: long beside what handing it out takes, short beside what people notice.
+std::uint32_t framesInBatch(const Point& point)
+{
+    constexpr unsigned bitIterations = 1U << 22;
+    const unsigned frames = bitIterations / (point.blockSize * point.iterations);
+    return std::max(frames / 64, 1U) * 64;
+}
+
+double secondsSince(Clock::time_point start)
+{
+    return std::chrono::duration<double>(Clock::now() - start).count();
+}
+
+/// The simulation of one point.
+class PointRun {
+public:
+    PointRun(const Plan& plan, const RunParts& parts, PointResult result)
+        : itsPlan(plan),
+          itsParts(parts),
+          itsResult(result),
+          itsCount(plan.rules, plan.frames, std::move(result.tally)),
+          itsBatchSize(framesInBatch(plan.points[result.number])),
+          itsNext(plan.frames.from + itsResult.tally.blocks)
+    {
+    }
+
+    /// Simulates until the point ends; false if it was interrupted.
+    bool go()
+    {
+        bool isInterrupted = false;
+        while (!isInterrupted && !itsCount.isComplete() && !isTimeUp()) {
+            handOut();
+            takeResult();
+            isInterrupted = itsParts.isInterrupted();
+        }
+        itsParts.workers.forgetAll();
+        update();
+        return !isInterrupted;
+    }
+
+    /// What has been counted.
+    const PointResult& result() const
+    {
+        return itsResult;
+    }
+
+private:
+    void handOut()
+    {
+        const unsigned workers = itsParts.workers.count();
+        const std::uint64_t counted = itsPlan.frames.from + itsCount.tally().blocks;
+        const std::uint64_t furthest = counted + std::uint64_t{batchesWaiting} * workers * itsBatchSize;
+        const std::uint64_t end = std::min(furthest, lastFrame());
+        while (itsBatchesOut < batchesAhead * workers && itsNext < end) {
+            const auto count = static_cast<std::uint32_t>(std::min<std::uint64_t>(itsBatchSize, end - itsNext));
+            itsParts.workers.handOut({itsResult.number, itsNext, count});
+            itsNext += count;
+            itsBatchesOut += 1;
+        }
+    }
+
+    /// The frame that surely need not be simulated any more.
+    std::uint64_t lastFrame() const
+    {
+        const FrameRange& frames = itsPlan.frames;
+        const std::uint64_t most = itsPlan.rules.maxBlocks.value_or(UINT64_MAX);
+        return most < frames.to - frames.from ? frames.from + most : frames.to;
+    }
+
+    void takeResult()
+    {
+        auto result = itsParts.workers.take(patience);
+        if (result) {
+            itsCount.take(*std::move(result));
+            itsBatchesOut -= 1;
+        }
+        update();
+        itsParts.progress.isAt(itsResult);
+        if (Clock::now() - itsLastCheckpoint >= checkpointInterval) {
+            itsParts.journal.keep(itsResult);
+            itsLastCheckpoint = Clock::now();
+        }
+    }
+
+    void update()
+    {
+        itsResult.tally = itsCount.tally();
+        itsResult.seconds = itsSecondsBefore + secondsSince(itsStart);
+    }
+
+    bool isTimeUp() const
+    {
+        const auto& limit = itsPlan.rules.maxSeconds;
+        return limit && itsResult.tally.blocks > 0 && itsResult.seconds >= *limit;
+    }
+
+    const Plan& itsPlan;
+    const RunParts& itsParts;
+    PointResult itsResult;
+    PointCount itsCount;
+    std::uint32_t itsBatchSize;
+    std::uint64_t itsNext;       // the first frame that has not been handed out
+    unsigned itsBatchesOut = 0;  // handed out, and not taken back
+    double itsSecondsBefore = itsResult.seconds;
+    Clock::time_point itsStart = Clock::now();
+    Clock::time_point itsLastCheckpoint = itsStart;
+};
+
+}  // namespace
+
+bool run(const Plan& plan, const RunParts& parts)
+{
+    Journal& journal = parts.journal;
+    for (const PointResult& point : journal.ended()) {
+        parts.progress.hasEnded(point);
+    }
+    const std::size_t next = journal.ended().empty() ? 0 : journal.ended().back().number + 1;
+    for (std::size_t point = next; point < plan.points.size(); ++point) {
+        if (isCurveEnded(plan, point, journal.ended())) {
+            continue;
+        }
+        PointRun pointRun(plan, parts, journal.resultSoFar(point));
+        if (!pointRun.go()) {
+            journal.keep(pointRun.result());
+            return false;
+        }
+        journal.end(pointRun.result());
+        parts.progress.hasEnded(pointRun.result());
+    }
+    journal.complete();
+    return true;
+}
+
+}  // namespace simulation

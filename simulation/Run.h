@@ -1,0 +1,28 @@
+// Run: simulates the points of a plan.
+#ifndef MORVIK_SIMULATION_RUN_H
+#define MORVIK_SIMULATION_RUN_H
+
+#include <functional>
+
+#include "Journal.h"
+#include "Plan.h"
+#include "Progress.h"
+#include "Workers.h"
+
+namespace simulation {
+
+/// What a run is made with.
+struct RunParts {
+    Workers& workers;
+    Journal& journal;
+    Progress& progress;
+    std::function<bool()> isInterrupted;  // asked several times a second
+};
+
+/// Simulates the points of the plan that the journal does not have, and keeps them there. Returns whether the run is
+/// complete: false after an interruption, which leaves a checkpoint of all that has been counted.
+bool run(const Plan& plan, const RunParts& parts);
+
+}  // namespace simulation
+
+#endif

@@ -1,0 +1,31 @@
+// Tally: what is counted at a point.
+#include "Tally.h"
+
+#include <algorithm>
+
+namespace simulation {
+
+void ErrorCounts::add(std::uint64_t frame, std::uint32_t wrongBits)
+{
+    if (wrongBits == 0) {
+        return;
+    }
+    bitErrors += wrongBits;
+    blockErrors += 1;
+    bitErrorSquares += std::uint64_t{wrongBits} * wrongBits;
+    if (failures.size() < keptFailures) {
+        failures.push_back(frame);
+    }
+}
+
+void ErrorCounts::add(const ErrorCounts& other)
+{
+    bitErrors += other.bitErrors;
+    blockErrors += other.blockErrors;
+    bitErrorSquares += other.bitErrorSquares;
+    failures.insert(failures.end(), other.failures.begin(), other.failures.end());
+    std::sort(failures.begin(), failures.end());
+    failures.resize(std::min(failures.size(), keptFailures));
+}
+
+}  // namespace simulation

@@ -1,0 +1,116 @@
+// ThreadWorkers: the threads of this process at work for a run.
+#include "ThreadWorkers.h"
+
+#include <string>
+#include <system_error>
+#include <utility>
+
+#include "Error.h"
+#include "FrameSimulator.h"
+
+namespace simulation {
+
+ThreadWorkers::ThreadWorkers(const Plan& plan, unsigned threads, const std::string& instructionSet)
+{
+    try {
+        for (unsigned i = 0; i < threads; ++i) {
+            itsThreads.emplace_back([this, &plan, instructionSet] { work(plan, instructionSet); });
+        }
+    } catch (const std::system_error& error) {
+        endThreads();
+        throw Error(std::to_string(threads) + " threads cannot be started: " + error.code().message());
+    }
+}
+
+ThreadWorkers::~ThreadWorkers()
+{
+    endThreads();
+}
+
+void ThreadWorkers::endThreads()
+{
+    {
+        const std::lock_guard lock(itsMutex);
+        itsIsEnding = true;
+        itsGeneration += 1;
+    }
+    itsHasBatch.notify_all();
+    for (std::thread& thread : itsThreads) {
+        thread.join();
+    }
+}
+
+unsigned ThreadWorkers::count() const
+{
+    return static_cast<unsigned>(itsThreads.size());
+}
+
+void ThreadWorkers::handOut(const FrameBatch& batch)
+{
+    {
+        const std::lock_guard lock(itsMutex);
+        itsBatches.push_back(batch);
+    }
+    itsHasBatch.notify_one();
+}
+
+std::optional<BatchResult> ThreadWorkers::take(std::chrono::milliseconds patience)
+{
+    std::unique_lock lock(itsMutex);
+    itsHasResult.wait_for(lock, patience, [this] { return !itsResults.empty() || itsFailure; });
+    if (itsFailure) {
+        std::rethrow_exception(itsFailure);
+    }
+    if (itsResults.empty()) {
+        return std::nullopt;
+    }
+    BatchResult result = std::move(itsResults.front());
+    itsResults.pop_front();
+    return result;
+}
+
+void ThreadWorkers::forgetAll()
+{
+    const std::lock_guard lock(itsMutex);
+    itsBatches.clear();
+    itsResults.clear();
+    itsGeneration += 1;
+}
+
+void ThreadWorkers::work(const Plan& plan, const std::string& instructionSet)
+{
+    try {
+        FrameSimulator simulator(plan, instructionSet);
+        simulateUntilEnd(simulator);
+    } catch (...) {
+        const std::lock_guard lock(itsMutex);
+        itsFailure = std::current_exception();
+        itsHasResult.notify_one();
+    }
+}
+
+void ThreadWorkers::simulateUntilEnd(FrameSimulator& simulator)
+{
+    std::unique_lock lock(itsMutex);
+    for (;;) {
+        itsHasBatch.wait(lock, [this] { return itsIsEnding || !itsBatches.empty(); });
+        if (itsIsEnding) {
+            return;
+        }
+        BatchResult result = simulator.begin(itsBatches.front());
+        itsBatches.pop_front();
+        const unsigned generation = itsGeneration;
+        bool goesOn = true;
+        while (goesOn && generation == itsGeneration) {
+            lock.unlock();
+            goesOn = simulator.proceed(result);
+            lock.lock();
+        }
+        if (generation == itsGeneration) {
+            itsResults.push_back(std::move(result));
+            itsHasResult.notify_one();
+        }
+    }
+}
+
+}  // namespace simulation

@@ -1,0 +1,52 @@
+// ThreadWorkers: the threads of this process at work for a run.
+#ifndef MORVIK_SIMULATION_THREADWORKERS_H
+#define MORVIK_SIMULATION_THREADWORKERS_H
+
+#include <condition_variable>
+#include <deque>
+#include <exception>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "Plan.h"
+#include "Workers.h"
+
+namespace simulation {
+
+class FrameSimulator;
+
+/// Threads with a decoder state each.
+class ThreadWorkers : public Workers {
+public:
+    /// Starts so many threads; throws Error if the system has none left. The plan outlives the workers. For the
+    /// instruction set, see FrameSimulator.
+    ThreadWorkers(const Plan& plan, unsigned threads, const std::string& instructionSet);
+    ~ThreadWorkers() override;
+
+    unsigned count() const override;
+    void handOut(const FrameBatch& batch) override;
+    std::optional<BatchResult> take(std::chrono::milliseconds patience) override;
+    void forgetAll() override;
+
+private:
+    void endThreads();
+    void work(const Plan& plan, const std::string& instructionSet);
+    void simulateUntilEnd(FrameSimulator& simulator);
+
+    std::mutex itsMutex;  // of all that follows
+    std::condition_variable itsHasBatch;
+    std::condition_variable itsHasResult;
+    std::deque<FrameBatch> itsBatches;
+    std::deque<BatchResult> itsResults;
+    std::exception_ptr itsFailure;
+    unsigned itsGeneration = 0;  // counts the times that everything was forgotten
+    bool itsIsEnding = false;
+
+    std::vector<std::thread> itsThreads;
+};
+
+}  // namespace simulation
+
+#endif
