@@ -2,6 +2,7 @@
 #include "Ber.h"
 
 #include <algorithm>
+#include <csignal>
 #include <filesystem>
 #include <iostream>
 #include <memory>
@@ -56,14 +57,16 @@ int simulate(const BerOptions& options, const simulation::Plan& plan)
                   << std::endl;
     }
     const unsigned threads = options.threads > 0 ? options.threads : std::max(std::thread::hardware_concurrency(), 1U);
+    std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     const Interruption interruption;
     bool isComplete = false;
     {
         simulation::ThreadWorkers workers(plan, threads, options.instructionSet);
         const auto progress = progressOf(options, plan);
-        isComplete = run(plan, {workers, journal, *progress, [] {
-                                    return Interruption::signal() != 0;
-                                }});
+        const auto isInterrupted = [] {
+            return Interruption::signal() != 0;
+        };
+        isComplete = run(plan, {workers, journal, *progress, isInterrupted, options.secondsBetweenCheckpoints});
     }
     if (isComplete) {
         return success;

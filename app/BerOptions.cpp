@@ -152,7 +152,7 @@ std::optional<double> parseReal(std::string_view text)
 }
 
 /// Reads 90, 90s, 1.5m or 2h.
-double parseSeconds(const std::string& text)
+double parseSeconds(const std::string& option, const std::string& text)
 {
     double unit = 1;
     std::string number = text;
@@ -165,7 +165,7 @@ double parseSeconds(const std::string& text)
     }
     const auto value = parseReal(number);
     if (!value || !(*value > 0 && *value < 1e9)) {
-        refuse("--max-time", text, "allowed are numbers above 0, of seconds, or with s, m or h behind them");
+        refuse(option, text, "allowed are numbers above 0, of seconds, or with s, m or h behind them");
     }
     return *value * unit;
 }
@@ -252,7 +252,7 @@ void addRuleOptions(CLI::App& command, BerOptions& options)
     command
         .add_option_function<std::string>(
             "--max-time",
-            [&options](const std::string& text) { options.maxSeconds = parseSeconds(text); },
+            [&options](const std::string& text) { options.maxSeconds = parseSeconds("--max-time", text); },
             "End a point after a time, such as 90, 1.5m or 2h; the only rule by which two runs can differ")
         ->type_name("T");
     command
@@ -296,6 +296,15 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
     CLI::Option* const output =
         command.add_option("--output", options.output, "Results, as CSV or JSON by the ending .csv or .json")
             ->type_name("FILE");
+    command
+        .add_option_function<std::string>(
+            "--checkpoint-interval",
+            [&options](const std::string& text) {
+                options.secondsBetweenCheckpoints = parseSeconds("--checkpoint-interval", text);
+            },
+            "How much time's work a crash may cost at most, such as 10 or 5m")
+        ->type_name("T")
+        ->default_str("3");
     command.add_flag("--resume", options.resume, "Go on where the run with the same parameters was stopped")
         ->needs(output);
     command.add_flag("--quiet", options.quiet, "Print no table")->needs(output);

@@ -33,6 +33,7 @@ struct BerOptions {
     std::uint32_t threads = 0;  // 0 for all cores
     std::string instructionSet;
     std::string output;
+    double secondsBetweenCheckpoints = 3;
     bool resume = false;
     bool quiet = false;
     std::optional<ReplayedFrame> replay;

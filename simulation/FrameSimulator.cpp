@@ -15,7 +15,7 @@ namespace {
 /// least as many as the encoder and the decoder take at once.
 std::uint32_t framesAtOnce(unsigned blockSize)
 {
-    return std::max(16384 / blockSize, 1U) * 64;
+    return std::max(1024 / blockSize, 1U) * 64;
 }
 
 }  // namespace

@@ -14,7 +14,6 @@ namespace {
 using Clock = std::chrono::steady_clock;
 
 constexpr std::chrono::milliseconds patience(100);
-constexpr std::chrono::seconds checkpointInterval(3);
 
 /// Batches for each worker that are handed out at a time, so that it need not wait for the next.
 constexpr unsigned batchesAhead = 4;
@@ -23,12 +22,14 @@ constexpr unsigned batchesAhead = 4;
 /// worker's may take of the memory.
 constexpr unsigned batchesWaiting = 64;
 
+/// As many frames as the encoder takes at a time.
+constexpr std::uint32_t smallestBatch = 64;
+
 /// A batch takes some milliseconds: long beside what handing it out takes, short beside what people notice.
-std::uint32_t framesInBatch(const Point& point)
+std::uint32_t largestBatch(const Point& point)
 {
     constexpr unsigned bitIterations = 1U << 22;
-    const unsigned frames = bitIterations / (point.blockSize * point.iterations);
-    return std::max(frames / 64, 1U) * 64;
+    return std::max(bitIterations / (point.blockSize * point.iterations), smallestBatch);
 }
 
 double secondsSince(Clock::time_point start)
@@ -44,7 +45,7 @@ public:
           itsParts(parts),
           itsResult(result),
           itsCount(plan.rules, plan.frames, std::move(result.tally)),
-          itsBatchSize(framesInBatch(plan.points[result.number])),
+          itsLargestBatch(largestBatch(plan.points[result.number])),
           itsNext(plan.frames.from + itsResult.tally.blocks)
     {
     }
@@ -74,14 +75,22 @@ private:
     {
         const unsigned workers = itsParts.workers.count();
         const std::uint64_t counted = itsPlan.frames.from + itsCount.tally().blocks;
-        const std::uint64_t furthest = counted + std::uint64_t{batchesWaiting} * workers * itsBatchSize;
+        const std::uint64_t furthest = counted + std::uint64_t{batchesWaiting} * workers * itsLargestBatch;
         const std::uint64_t end = std::min(furthest, lastFrame());
         while (itsBatchesOut < batchesAhead * workers && itsNext < end) {
-            const auto count = static_cast<std::uint32_t>(std::min<std::uint64_t>(itsBatchSize, end - itsNext));
+            const auto count = static_cast<std::uint32_t>(std::min<std::uint64_t>(batchSize(), end - itsNext));
             itsParts.workers.handOut({itsResult.number, itsNext, count});
             itsNext += count;
             itsBatchesOut += 1;
         }
+    }
+
+    /// Batches grow with the point: one that ends early shall not have many frames handed out for nothing.
+    std::uint32_t batchSize() const
+    {
+        const std::uint64_t share = (itsNext - itsPlan.frames.from) / (2 * batchesAhead * itsParts.workers.count());
+        const std::uint64_t size = std::clamp<std::uint64_t>(share, smallestBatch, itsLargestBatch);
+        return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch);
     }
 
     /// The frame that surely need not be simulated any more.
@@ -101,7 +110,7 @@ private:
         }
         update();
         itsParts.progress.isAt(itsResult);
-        if (Clock::now() - itsLastCheckpoint >= checkpointInterval) {
+        if (secondsSince(itsLastCheckpoint) >= itsParts.secondsBetweenCheckpoints) {
             itsParts.journal.keep(itsResult);
             itsLastCheckpoint = Clock::now();
         }
@@ -123,7 +132,7 @@ private:
     const RunParts& itsParts;
     PointResult itsResult;
     PointCount itsCount;
-    std::uint32_t itsBatchSize;
+    std::uint32_t itsLargestBatch;
     std::uint64_t itsNext;       // the first frame that has not been handed out
     unsigned itsBatchesOut = 0;  // handed out, and not taken back
     double itsSecondsBefore = itsResult.seconds;

@@ -16,7 +16,8 @@ struct RunParts {
     Workers& workers;
     Journal& journal;
     Progress& progress;
-    std::function<bool()> isInterrupted;  // asked several times a second
+    std::function<bool()> isInterrupted;   // asked several times a second
+    double secondsBetweenCheckpoints = 3;  // at most that much work is lost in a crash
 };
 
 /// Simulates the points of the plan that the journal does not have, and keeps them there. Returns whether the run is
