@@ -137,7 +137,7 @@ const std::vector<Column> allColumns = {
      [](Text field, Row& row) { return readInto(FrameSet::parse(field), row.frames) && row.frames.size() > 0; }},
     {"blocks", number,
      [](const Row& row) { return std::to_string(row.frames.size()); },
-     skip},
+     [](Text field, Row& row) { return field == std::to_string(row.frames.size()); }},
     {"bit_errors", number,
      [](const Row& row) { return std::to_string(row.errors.bitErrors); },
      [](Text field, Row& row) { return readNumber(field, row.errors.bitErrors); }},

@@ -2,13 +2,10 @@
 #include "CommandRunner.h"
 
 #include <fcntl.h>
-#include <stdlib.h>
+#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <stdexcept>
 #include <utility>
 
@@ -64,20 +61,15 @@ int Process::wait()
     return WIFEXITED(status) ? WEXITSTATUS(status) : -WTERMSIG(status);
 }
 
-CommandRunner::CommandRunner(std::string program) : itsProgram(std::move(program))
+// NOLINTNEXTLINE(readability-make-member-function-const): the process is another afterwards.
+void Process::send(int signal)
 {
-    std::string name = (std::filesystem::temp_directory_path() / "morvik-test-XXXXXX").string();
-    if (mkdtemp(name.data()) == nullptr) {
-        throw std::runtime_error("cannot make a temporary directory");
+    if (kill(itsId, signal) != 0) {
+        throw std::runtime_error("cannot send a signal");
     }
-    itsDirectory = name;
 }
 
-CommandRunner::~CommandRunner()
-{
-    std::error_code ignored;  // what cannot be removed stays among the temporary files
-    std::filesystem::remove_all(itsDirectory, ignored);
-}
+CommandRunner::CommandRunner(std::string program) : itsProgram(std::move(program)) {}
 
 const std::string& CommandRunner::program() const
 {
@@ -86,21 +78,22 @@ const std::string& CommandRunner::program() const
 
 const std::string& CommandRunner::directory() const
 {
-    return itsDirectory;
+    return itsFolder.path();
 }
 
 void CommandRunner::write(const std::string& file, const std::string& text) const
 {
-    std::ofstream(path(file), std::ios::binary) << text;
+    itsFolder.write(file, text);
 }
 
 std::string CommandRunner::read(const std::string& file) const
 {
-    std::ifstream stream(path(file), std::ios::binary);
-    if (!stream) {
-        throw std::runtime_error("cannot read " + file);
-    }
-    return std::string(std::istreambuf_iterator<char>(stream), {});
+    return itsFolder.read(file);
+}
+
+std::vector<std::string> CommandRunner::names() const
+{
+    return itsFolder.names();
 }
 
 CommandResult CommandRunner::run(const std::vector<std::string>& arguments,
@@ -108,20 +101,15 @@ CommandResult CommandRunner::run(const std::vector<std::string>& arguments,
                                  const std::string& output) const
 {
     const std::string out = output.empty() ? ".out" : output;
-    const int streams[] = {openOrThrow(path(input), O_RDONLY),
-                           openOrThrow(path(out), O_WRONLY | O_CREAT | O_TRUNC),
-                           openOrThrow(path(".err"), O_WRONLY | O_CREAT | O_TRUNC)};
-    Process process(itsProgram, arguments, itsDirectory, streams);
+    const int streams[] = {openOrThrow(itsFolder.path(input), O_RDONLY),
+                           openOrThrow(itsFolder.path(out), O_WRONLY | O_CREAT | O_TRUNC),
+                           openOrThrow(itsFolder.path(".err"), O_WRONLY | O_CREAT | O_TRUNC)};
+    Process process(itsProgram, arguments, directory(), streams);
     for (const int stream : streams) {
         close(stream);
     }
     const int status = process.wait();
     return {status, output.empty() ? read(out) : std::string(), read(".err")};
-}
-
-std::string CommandRunner::path(const std::string& file) const
-{
-    return (std::filesystem::path(itsDirectory) / file).string();  // an absolute name stays as it is
 }
 
 }  // namespace support

@@ -7,6 +7,8 @@
 #include <string>
 #include <vector>
 
+#include "TemporaryFolder.h"
+
 namespace support {
 
 /// What a finished program leaves behind.
@@ -25,6 +27,9 @@ public:
             const std::string& directory,
             const int (&streams)[3]);
 
+    /// Sends it a signal.
+    void send(int signal);
+
     /// Waits for the end; the status is that of CommandResult.
     int wait();
 
@@ -36,9 +41,6 @@ private:
 class CommandRunner {
 public:
     explicit CommandRunner(std::string program);
-    CommandRunner(const CommandRunner&) = delete;
-    CommandRunner& operator=(const CommandRunner&) = delete;
-    ~CommandRunner();
 
     const std::string& program() const;
     const std::string& directory() const;
@@ -49,16 +51,17 @@ public:
     /// The content of a file, its name being relative to the directory.
     std::string read(const std::string& file) const;
 
+    /// The names of all files in the directory that are not hidden, sorted.
+    std::vector<std::string> names() const;
+
     /// Runs the program to its end. An empty `output` keeps the standard output for the result.
     CommandResult run(const std::vector<std::string>& arguments,
                       const std::string& input = "/dev/null",
                       const std::string& output = "") const;
 
 private:
-    std::string path(const std::string& file) const;
-
     std::string itsProgram;
-    std::string itsDirectory;
+    TemporaryFolder itsFolder;
 };
 
 }  // namespace support

@@ -1,0 +1,145 @@
+// Journal: what is kept on the disk while a run goes on, and which earlier run it goes on from.
+#include "simulation/Journal.h"
+
+#include <gtest/gtest.h>
+
+#include "simulation/Error.h"
+#include "simulation/ResultFiles.h"
+#include "support/SyntheticFrames.h"
+#include "support/TemporaryFolder.h"
+
+namespace {
+
+using namespace simulation;
+using Earlier = Journal::Earlier;
+using Names = std::vector<std::string>;
+
+class JournalFiles : public testing::Test {
+protected:
+    JournalFiles()
+    {
+        plan.points = pointsOf({{40}, {4}, {1}, {std::nullopt}, {8}, {0, 500}});
+        plan.version = "1.2.3";
+        plan.command = "morvik ber --seed 1";
+    }
+
+    static PointResult resultOf(std::size_t number, std::uint64_t blocks)
+    {
+        return {number, support::countOneByOne(support::SyntheticFrames(1), {0, blocks}, StopRules(), 1), 1};
+    }
+
+    /// Why the journal cannot be opened.
+    std::string refusal(Earlier earlier) const
+    {
+        try {
+            const Journal journal(plan, output, earlier);
+        } catch (const Error& error) {
+            return error.what();
+        }
+        return "none";
+    }
+
+    const support::TemporaryFolder folder;
+    const std::string output = folder.path("results.csv");
+    const std::string checkpoint = output + ".checkpoint";
+    Plan plan;
+};
+
+TEST_F(JournalFiles, AreACheckpointAtFirst)
+{
+    const Journal journal(plan, output, Earlier::refuse);
+    EXPECT_FALSE(journal.isResumed());
+    EXPECT_EQ(folder.names(), Names{"results.csv.checkpoint"});
+    EXPECT_EQ(journal.resultSoFar(1).tally.blocks, 0U);
+}
+
+TEST_F(JournalFiles, LeaveEarlierResultsUntilThereAreNewOnes)
+{
+    folder.write("results.csv", "of last year");
+    Journal journal(plan, output, Earlier::refuse);
+    journal.keep(resultOf(0, 10));
+    EXPECT_EQ(folder.read("results.csv"), "of last year");
+    journal.end(resultOf(0, 20));
+    EXPECT_EQ(folder.read("results.csv"), csvText(resultsOf(plan, {resultOf(0, 20)})));
+}
+
+TEST_F(JournalFiles, AreTheResultsAloneAtLast)
+{
+    Journal journal(plan, output, Earlier::refuse);
+    journal.end(resultOf(0, 20));
+    journal.end(resultOf(1, 30));
+    journal.complete();
+    EXPECT_EQ(folder.names(), Names{"results.csv"});
+    EXPECT_EQ(folder.read("results.csv"), csvText(resultsOf(plan, {resultOf(0, 20), resultOf(1, 30)})));
+}
+
+TEST_F(JournalFiles, AreNotNeeded)
+{
+    Journal journal(plan, "", Earlier::refuse);
+    journal.keep(resultOf(0, 10));
+    journal.end(resultOf(0, 20));
+    journal.complete();
+    EXPECT_EQ(journal.ended().size(), 1U);
+    EXPECT_EQ(folder.names(), Names{});
+}
+
+TEST_F(JournalFiles, TellHowFarARunHasCome)
+{
+    {
+        Journal journal(plan, output, Earlier::refuse);
+        journal.end(resultOf(0, 20));
+        journal.keep(resultOf(1, 7));
+    }
+    const Journal journal(plan, output, Earlier::resume);
+    EXPECT_TRUE(journal.isResumed());
+    ASSERT_EQ(journal.ended().size(), 1U);
+    support::expectEqual(journal.ended()[0].tally, resultOf(0, 20).tally);
+    support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 7).tally);
+    EXPECT_EQ(journal.resultSoFar(1).seconds, 1);
+}
+
+TEST_F(JournalFiles, ResumeFromTheBeginningWithoutACheckpoint)
+{
+    const Journal journal(plan, output, Earlier::resume);
+    EXPECT_FALSE(journal.isResumed());
+    EXPECT_TRUE(journal.ended().empty());
+}
+
+TEST_F(JournalFiles, AreNotLostToAnotherRun)
+{
+    {
+        Journal journal(plan, output, Earlier::refuse);
+        journal.keep(resultOf(0, 10));
+    }
+    const std::string before = folder.read("results.csv.checkpoint");
+    EXPECT_EQ(refusal(Earlier::refuse),
+              checkpoint + ": holds an unfinished run; go on with it by --resume, or remove it");
+    EXPECT_EQ(folder.read("results.csv.checkpoint"), before);
+}
+
+TEST_F(JournalFiles, OfOtherParametersAreRefused)
+{
+    {
+        const Journal journal(plan, output, Earlier::refuse);
+    }
+    plan.command = "morvik ber --seed 2";
+    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run with other parameters: morvik ber --seed 1");
+    plan.command = "morvik ber --seed 1";
+    plan.version = "1.2.4";
+    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run of version 1.2.3, this is 1.2.4");
+}
+
+TEST_F(JournalFiles, ThatAreDamagedAreRefused)
+{
+    folder.write("results.csv.checkpoint", "morvik checkpoint 0123456789abcdef\n{}\n");
+    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": is damaged and cannot be resumed; remove it to start anew");
+}
+
+TEST_F(JournalFiles, ThatCannotBeWrittenAreRefusedAtOnce)
+{
+    EXPECT_THROW(Journal(plan, folder.path("none/results.csv"), Earlier::refuse), Error);
+    EXPECT_THROW(Journal(plan, folder.path("results.txt"), Earlier::refuse), Error);
+    EXPECT_EQ(folder.names(), Names{});
+}
+
+}  // namespace

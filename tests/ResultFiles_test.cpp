@@ -1,0 +1,147 @@
+// ResultFiles: what is written as CSV and JSON, and read back.
+#include "simulation/ResultFiles.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <nlohmann/json.hpp>
+
+#include "simulation/Error.h"
+#include "support/ExampleResults.h"
+#include "support/TemporaryFolder.h"
+
+namespace {
+
+using namespace simulation;
+using support::exampleRow;
+
+const std::string header =
+    "point,block_size,num_pu,algorithm,scale_option,iterations,ebn0_db,scale,frames,blocks,bit_errors,block_errors,"
+    "bit_error_squares,ber,ber_low,ber_high,bler,bler_low,bler_high,clipped_values,clipped_fraction,failed_frames,"
+    "seconds,seed,version\n";
+
+Results exampleResults()
+{
+    ResultRow given = exampleRow(1, -500, {15, 19});
+    given.point.scaleOption = 12000;
+    given.point.milliScale = 12000;
+    given.seed = UINT64_MAX;
+    return {"1.2.3", "morvik ber --block-size 40 \"quoted\"", {exampleRow(0, 1250, {0, 40}), given}};
+}
+
+class ResultFiles : public testing::Test {
+protected:
+    /// Reads the text from a file of that name, and returns why it is refused.
+    std::string refusal(const std::string& name, const std::string& text) const
+    {
+        folder.write(name, text);
+        try {
+            readResults(folder.path(name));
+        } catch (const Error& error) {
+            const std::string message = error.what();
+            const std::string place = folder.path("");
+            EXPECT_EQ(message.substr(0, place.size()), place);
+            return message.substr(std::min(message.size(), place.size()));
+        }
+        return "none";
+    }
+
+    /// The CSV of one row with a field replaced.
+    static std::string csvWith(const std::string& field, const std::string& replacement)
+    {
+        std::string text = csvText({"1.2.3", "", {exampleRow(0, 1250, {0, 40})}});
+        const std::size_t place = text.find(field, header.size());
+        EXPECT_NE(place, std::string::npos);
+        return text.replace(place, field.size(), replacement);
+    }
+
+    const support::TemporaryFolder folder;
+};
+
+TEST_F(ResultFiles, HoldARowForEachPointAsCsv)
+{
+    EXPECT_EQ(csvText(exampleResults()),
+              header +
+                  "0,40,4,scaled,auto,8,1.25,8.125,0:40,40,28,4,196,1.750000e-02,4.785692e-03,4.420994e-02,"
+                  "1.000000e-01,2.792542e-02,2.366374e-01,120,2.272727e-02,0 10 20 30,0.125,1,1.2.3\n"
+                  "1,40,4,scaled,12,8,-0.5,12,15:19,4,0,0,0,0.000000e+00,0.000000e+00,5.271292e-01,0.000000e+00,"
+                  "0.000000e+00,5.271292e-01,12,2.272727e-02,,0.125,18446744073709551615,1.2.3\n");
+}
+
+TEST_F(ResultFiles, HoldTheSameAsJson)
+{
+    const auto json = nlohmann::json::parse(jsonText(exampleResults()));
+    EXPECT_EQ(json.at("version"), "1.2.3");
+    EXPECT_EQ(json.at("command"), "morvik ber --block-size 40 \"quoted\"");
+    ASSERT_EQ(json.at("rows").size(), 2U);
+    const auto& row = json["rows"][0];
+    EXPECT_EQ(row.size(), 25U);
+    EXPECT_EQ(row.at("block_size"), 40);
+    EXPECT_EQ(row.at("algorithm"), "scaled");
+    EXPECT_EQ(row.at("scale_option"), "auto");
+    EXPECT_EQ(row.at("ebn0_db"), 1.25);
+    EXPECT_EQ(row.at("frames"), "0:40");
+    EXPECT_EQ(row.at("bler"), 0.1);
+    EXPECT_EQ(row.at("failed_frames"), (std::vector<int>{0, 10, 20, 30}));
+    EXPECT_EQ(json["rows"][1].at("seed"), UINT64_MAX);
+    EXPECT_TRUE(json["rows"][1].at("failed_frames").empty());
+}
+
+TEST_F(ResultFiles, AreReadAsTheyWereWritten)
+{
+    const Results results = exampleResults();
+    writeResults(folder.path("a.csv"), results);
+    writeResults(folder.path("a.json"), results);
+    EXPECT_EQ(folder.read("a.csv"), csvText(results));
+    EXPECT_EQ(folder.read("a.json"), jsonText(results));
+    EXPECT_EQ(csvText(readResults(folder.path("a.csv"))), csvText(results));
+    EXPECT_EQ(jsonText(readResults(folder.path("a.json"))), jsonText(results));
+}
+
+TEST_F(ResultFiles, AreRefusedByOtherNames)
+{
+    for (const char* name : {"a.txt", "a", "csv", ".csv", "a.csv.gz", "-"}) {
+        EXPECT_THROW(formatOf(name), Error) << name;
+    }
+    EXPECT_EQ(formatOf("folder.json/a.csv"), ResultFormat::csv);
+    EXPECT_EQ(formatOf("a.b.json"), ResultFormat::json);
+}
+
+TEST_F(ResultFiles, ThatAreNotThereAreRefused)
+{
+    EXPECT_THROW(readResults(folder.path("none.csv")), Error);
+    EXPECT_THROW(readResults(folder.path("none.json")), Error);
+}
+
+TEST_F(ResultFiles, WithMistakesAreRefusedWithTheirPlaces)
+{
+    EXPECT_EQ(refusal("a.csv", "").substr(0, 45), "a.csv:1: no header of a result file, expected");
+    EXPECT_EQ(refusal("a.csv", header + "1,2\n"), "a.csv:2: 2 fields, expected 25");
+    EXPECT_EQ(refusal("a.csv", csvWith("0,40,4,", "0,41,4,")), "a.csv:2: block_size \"41\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",scaled,", ",sealed,")), "a.csv:2: algorithm \"sealed\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",auto,", ",automatic,")), "a.csv:2: scale_option \"automatic\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",1.25,", ",1.25dB,")), "a.csv:2: ebn0_db \"1.25dB\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,", ",40:0,")), "a.csv:2: frames \"40:0\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,", ",,")), "a.csv:2: frames \"\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",40,28,", ",41,28,")), "a.csv:2: blocks \"41\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,", ",-28,")), "a.csv:2: bit_errors \"-28\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith("0 10 20", "0 x 20")), "a.csv:2: failed_frames \"0 x 20 30\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",0.125,", ",soon,")), "a.csv:2: seconds \"soon\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",1.2.3", ",")), "a.csv:2: version \"\" is not allowed");
+}
+
+TEST_F(ResultFiles, OfBrokenJsonAreRefused)
+{
+    const std::string whole = jsonText(exampleResults());
+    for (const std::string& text : {std::string(), std::string("[]"), std::string("{}"), whole.substr(0, 300)}) {
+        EXPECT_EQ(refusal("a.json", text).substr(0, 27), "a.json: is no result file (");
+    }
+    std::string wrong = whole;
+    wrong.replace(wrong.find("\"ebn0_db\": 1.25"), 15, "\"ebn0_db\": \"1\"");
+    EXPECT_EQ(refusal("a.json", wrong), "a.json: row 1: ebn0_db \"\" is not allowed");
+    wrong = whole;
+    wrong.replace(wrong.find("\"bit_errors\""), 12, "\"bat_errors\"");
+    EXPECT_EQ(refusal("a.json", wrong).substr(0, 27), "a.json: is no result file (");
+}
+
+}  // namespace

@@ -1,0 +1,31 @@
+// ExampleResults: rows of result files for tests.
+#ifndef MORVIK_TESTS_EXAMPLERESULTS_H
+#define MORVIK_TESTS_EXAMPLERESULTS_H
+
+#include <cstdint>
+
+#include "simulation/Results.h"
+
+namespace support {
+
+/// A row of K = 40 at so many thousandths of a decibel, of which the frames with a number divisible by 10 have failed
+/// with 7 wrong bits.
+inline simulation::ResultRow exampleRow(std::size_t number, int milliDecibels, simulation::FrameRange frames)
+{
+    simulation::ResultRow row;
+    row.pointNumber = number;
+    row.point = {40, 4, 1, std::nullopt, 8125, 8, milliDecibels};
+    row.frames = simulation::FrameSet(frames);
+    for (std::uint64_t frame = frames.from; frame < frames.to; ++frame) {
+        row.errors.add(frame, frame % 10 == 0 ? 7 : 0);
+    }
+    row.clipped = 3 * row.frames.size();
+    row.seconds = 0.125;
+    row.seed = 1;
+    row.version = "1.2.3";
+    return row;
+}
+
+}  // namespace support
+
+#endif
