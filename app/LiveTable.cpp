@@ -33,11 +33,11 @@ std::string right(const std::string& text, std::size_t width)
     return std::string(width - std::min(width, text.size()), ' ') + text;
 }
 
-/// "1.23e-04".
-std::string rateText(double rate)
+/// "1.23e-04" with two decimals.
+std::string rateText(double rate, int decimals)
 {
     char text[32];
-    std::snprintf(text, sizeof text, "%.2e", rate);
+    std::snprintf(text, sizeof text, "%.*e", decimals, rate);
     return text;
 }
 
@@ -53,51 +53,60 @@ std::string timeText(double seconds)
     return hours + minutes + ':' + twoDigits(whole % 60);
 }
 
-std::string cells(const std::string& point,
-                  const std::string& iterations,
-                  const std::string& ebn0,
-                  const std::string& blocks,
-                  const std::string& errors,
-                  const std::string& bler,
-                  const std::string& bounds,
-                  const std::string& ber)
+/// The cells of a line, which fit into 79 columns. The iterations have none unless each of them is looked at.
+struct Line {
+    std::string point;
+    std::optional<std::string> iterations;
+    std::string ebn0;
+    std::string blocks;
+    std::string failed;
+    std::string bler;
+    std::string bounds;
+    std::string ber;
+    std::string speed;
+    std::string time;
+
+    std::string text() const
+    {
+        return right(point, 5) + (iterations ? right(*iterations, 5) : "") + right(ebn0, 7) + right(blocks, 10) +
+               right(failed, 7) + right(bler, 9) + right(bounds, 16) + right(ber, 9) + right(speed, 9) + right(time, 7);
+    }
+};
+
+std::string headLine(bool eachIteration)
 {
-    return right(point, 5) + right(iterations, iterations.empty() ? 0 : 6) + right(ebn0, 8) + right(blocks, 12) +
-           right(errors, 8) + right(bler, 11) + right(bounds, 21) + right(ber, 11);
+    Line line = {"point", {}, "Eb/N0", "blocks", "failed", "BLER", "95 % bounds", "BER", "blocks/s", "time"};
+    if (eachIteration) {
+        line.iterations = "iter";
+    }
+    return line.text();
 }
 
-std::string columnHeads(bool eachIteration)
-{
-    return cells("point", eachIteration ? "iter" : "", "Eb/N0", "blocks", "failed", "BLER", "95 % confidence", "BER") +
-           right("blocks/s", 11) + right("time", 9);
-}
-
-/// What has been counted, without the speed.
-std::string countCells(const ResultRow& row, bool eachIteration)
+Line lineOf(const ResultRow& row, bool eachIteration)
 {
     const std::uint64_t blocks = row.frames.size();
     const auto bounds = simulation::blockErrorBounds(row.errors, blocks);
     const bool hasFailed = row.errors.blockErrors > 0;
     const auto rate = [hasFailed](double value) {
-        return hasFailed ? rateText(value) : "0";
+        return hasFailed ? rateText(value, 2) : "0";
     };
-    return cells(std::to_string(row.pointNumber),
-                 eachIteration ? std::to_string(row.point.iterations) : "",
-                 simulation::thousandthsText(row.point.milliDecibels),
-                 std::to_string(blocks),
-                 std::to_string(row.errors.blockErrors),
-                 rate(simulation::blockErrorRate(row)),
-                 (hasFailed ? rateText(bounds.low) + " .. " : "below ") + rateText(bounds.high),
-                 rate(simulation::bitErrorRate(row)));
+    Line line;
+    line.point = std::to_string(row.pointNumber);
+    if (eachIteration) {
+        line.iterations = std::to_string(row.point.iterations);
+    }
+    line.ebn0 = simulation::thousandthsText(row.point.milliDecibels);
+    line.blocks = std::to_string(blocks);
+    line.failed = std::to_string(row.errors.blockErrors);
+    line.bler = rate(simulation::blockErrorRate(row));
+    line.bounds = (hasFailed ? rateText(bounds.low, 1) + ' ' : "below ") + rateText(bounds.high, 1);
+    line.ber = rate(simulation::bitErrorRate(row));
+    line.speed = row.seconds > 0 ? std::to_string(std::lround(static_cast<double>(blocks) / row.seconds)) : "";
+    line.time = timeText(row.seconds);
+    return line;
 }
 
-std::string speedCell(const PointResult& point)
-{
-    const double speed = point.seconds > 0 ? static_cast<double>(point.tally.blocks) / point.seconds : 0;
-    return right(std::to_string(std::lround(speed)), 11);
-}
-
-std::string remaining(const Plan& plan, const PointResult& point)
+std::string timeLeft(const Plan& plan, const PointResult& point)
 {
     simulation::StopRules rules = plan.rules;
     rules.maxBlocks = std::min(rules.maxBlocks.value_or(UINT64_MAX), plan.frames.to - plan.frames.from);
@@ -136,11 +145,12 @@ void LiveTable::isAt(const PointResult& running)
     }
     itsLastMove = now;
     writeHeading(itsPlan.points[running.number]);
-    const ResultRow row = resultsOf(itsPlan, {running}).rows.back();
-    std::string line = countCells(row, itsPlan.eachIteration) + speedCell(running) + "  " + remaining(itsPlan, running);
-    line.resize(std::min(line.size(), *itsWidth - 1));  // a cursor behind the last column would go to the next line
+    Line line = lineOf(resultsOf(itsPlan, {running}).rows.back(), itsPlan.eachIteration);
+    line.bounds = timeLeft(itsPlan, running);
+    std::string text = line.text();
+    text.resize(std::min(text.size(), *itsWidth - 1));  // a cursor behind the last column would go to the next line
     itsHasMovingLine = true;
-    write('\r' + line + std::string(eraseToEnd));
+    write('\r' + text + std::string(eraseToEnd));
 }
 
 void LiveTable::hasEnded(const PointResult& point)
@@ -148,7 +158,7 @@ void LiveTable::hasEnded(const PointResult& point)
     eraseMovingLine();
     writeHeading(itsPlan.points[point.number]);
     for (const ResultRow& row : resultsOf(itsPlan, {point}).rows) {
-        write(countCells(row, itsPlan.eachIteration) + speedCell(point) + right(timeText(point.seconds), 9) + '\n');
+        write(lineOf(row, itsPlan.eachIteration).text() + '\n');
     }
 }
 
@@ -163,8 +173,8 @@ void LiveTable::writeHeading(const Point& point)
         std::to_string(point.iterations) + (point.iterations == 1 ? " iteration" : " iterations");
     write((itsHeading ? "\nK = " : "K = ") + std::to_string(point.blockSize) + ", " + std::to_string(point.numPu) +
           " units, " + simulation::algorithmName(point.algorithm) + ", scale " +
-          simulation::scaleOptionText(point.scaleOption) + ", " + iterations + '\n' +
-          columnHeads(itsPlan.eachIteration) + '\n');
+          simulation::scaleOptionText(point.scaleOption) + ", " + iterations + '\n' + headLine(itsPlan.eachIteration) +
+          '\n');
     itsHeading = point;
 }
 

@@ -23,7 +23,7 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     formatOf(itsOutput);
     checkWritable(itsOutput);
     readCheckpoint(earlier);
-    writeCheckpoint();
+    save(itsCheckpoint.running);
 }
 
 bool Journal::isResumed() const
@@ -44,23 +44,28 @@ PointResult Journal::resultSoFar(std::size_t point) const
     return {point, Tally(itsPlan.countsOf(itsPlan.points[point])), 0};
 }
 
-void Journal::keep(const PointResult& running)
-{
-    itsCheckpoint.running = running;
-    writeCheckpoint();
-}
-
 void Journal::end(const PointResult& point)
 {
     itsCheckpoint.ended.push_back(point);
     itsCheckpoint.running.reset();
-    writeCheckpoint();
-    writeResults();
+}
+
+void Journal::save(const std::optional<PointResult>& running)
+{
+    itsCheckpoint.running = running;
+    if (itsOutput.empty()) {
+        return;
+    }
+    writeAtomically(checkpointName(), checkpointText(itsCheckpoint));
+    if (itsResultsSaved < itsCheckpoint.ended.size()) {
+        writeResults(itsOutput, resultsOf(itsPlan, itsCheckpoint.ended));
+        itsResultsSaved = itsCheckpoint.ended.size();
+    }
 }
 
 void Journal::complete()
 {
-    writeResults();  // once more, for a run that was killed between the last two files
+    save(std::nullopt);
     if (!itsOutput.empty() && unlink(checkpointName().c_str()) != 0) {
         throw fileError(checkpointName(), "removed");
     }
@@ -92,20 +97,6 @@ void Journal::readCheckpoint(Earlier earlier)
     }
     itsCheckpoint = *checkpoint;
     itsIsResumed = true;
-}
-
-void Journal::writeCheckpoint() const
-{
-    if (!itsOutput.empty()) {
-        writeAtomically(checkpointName(), checkpointText(itsCheckpoint));
-    }
-}
-
-void Journal::writeResults() const
-{
-    if (!itsOutput.empty()) {
-        simulation::writeResults(itsOutput, resultsOf(itsPlan, itsCheckpoint.ended));
-    }
 }
 
 }  // namespace simulation

@@ -3,6 +3,7 @@
 #define MORVIK_SIMULATION_JOURNAL_H
 
 #include <cstddef>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -12,7 +13,7 @@
 namespace simulation {
 
 /// Keeps the results of the ended points in a file, and beside it, until the run is complete, a checkpoint. Both are
-/// there as a whole whenever the process is killed. All functions throw Error.
+/// there as a whole whenever the process is killed, as they were saved last. All functions throw Error.
 class Journal {
 public:
     /// What becomes of an earlier, unfinished run's checkpoint: it is in the way, or this run goes on from it.
@@ -31,13 +32,13 @@ public:
     /// What has been counted at a point that has not ended, maybe nothing.
     PointResult resultSoFar(std::size_t point) const;
 
-    /// Keeps what has been counted at a point that has not ended.
-    void keep(const PointResult& running);
-
-    /// Keeps a point that has ended.
+    /// Takes note of a point that has ended.
     void end(const PointResult& point);
 
-    /// The run is complete: the checkpoint goes.
+    /// Writes the files, with what has been counted at the running point, if one is.
+    void save(const std::optional<PointResult>& running);
+
+    /// The run is complete: writes the results, and the checkpoint goes.
     void complete();
 
     /// The name of the checkpoint.
@@ -45,13 +46,12 @@ public:
 
 private:
     void readCheckpoint(Earlier earlier);
-    void writeCheckpoint() const;
-    void writeResults() const;
 
     const Plan& itsPlan;
     std::string itsOutput;
     bool itsIsResumed = false;
     Checkpoint itsCheckpoint;
+    std::size_t itsResultsSaved = 0;  // how many points the results had when they were written last
 };
 
 }  // namespace simulation

@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <chrono>
 #include <cstdint>
+#include <optional>
+#include <utility>
 
 #include "PointCount.h"
 
@@ -37,12 +39,32 @@ double secondsSince(Clock::time_point start)
     return std::chrono::duration<double>(Clock::now() - start).count();
 }
 
+/// When the journal is saved.
+class Saving {
+public:
+    explicit Saving(const RunParts& parts) : itsJournal(parts.journal), itsInterval(parts.secondsBetweenCheckpoints) {}
+
+    void saveIfDue(const std::optional<PointResult>& running)
+    {
+        if (secondsSince(itsLast) >= itsInterval) {
+            itsJournal.save(running);
+            itsLast = Clock::now();
+        }
+    }
+
+private:
+    Journal& itsJournal;
+    double itsInterval;
+    Clock::time_point itsLast = Clock::now();
+};
+
 /// The simulation of one point.
 class PointRun {
 public:
-    PointRun(const Plan& plan, const RunParts& parts, PointResult result)
+    PointRun(const Plan& plan, const RunParts& parts, Saving& saving, PointResult result)
         : itsPlan(plan),
           itsParts(parts),
+          itsSaving(saving),
           itsResult(result),
           itsCount(plan.rules, plan.frames, std::move(result.tally)),
           itsLargestBatch(largestBatch(plan.points[result.number])),
@@ -110,10 +132,7 @@ private:
         }
         update();
         itsParts.progress.isAt(itsResult);
-        if (secondsSince(itsLastCheckpoint) >= itsParts.secondsBetweenCheckpoints) {
-            itsParts.journal.keep(itsResult);
-            itsLastCheckpoint = Clock::now();
-        }
+        itsSaving.saveIfDue(itsResult);
     }
 
     void update()
@@ -130,6 +149,7 @@ private:
 
     const Plan& itsPlan;
     const RunParts& itsParts;
+    Saving& itsSaving;
     PointResult itsResult;
     PointCount itsCount;
     std::uint32_t itsLargestBatch;
@@ -137,7 +157,6 @@ private:
     unsigned itsBatchesOut = 0;  // handed out, and not taken back
     double itsSecondsBefore = itsResult.seconds;
     Clock::time_point itsStart = Clock::now();
-    Clock::time_point itsLastCheckpoint = itsStart;
 };
 
 }  // namespace
@@ -145,6 +164,7 @@ private:
 bool run(const Plan& plan, const RunParts& parts)
 {
     Journal& journal = parts.journal;
+    Saving saving(parts);
     for (const PointResult& point : journal.ended()) {
         parts.progress.hasEnded(point);
     }
@@ -153,12 +173,13 @@ bool run(const Plan& plan, const RunParts& parts)
         if (isCurveEnded(plan, point, journal.ended())) {
             continue;
         }
-        PointRun pointRun(plan, parts, journal.resultSoFar(point));
+        PointRun pointRun(plan, parts, saving, journal.resultSoFar(point));
         if (!pointRun.go()) {
-            journal.keep(pointRun.result());
+            journal.save(pointRun.result());
             return false;
         }
         journal.end(pointRun.result());
+        saving.saveIfDue(std::nullopt);
         parts.progress.hasEnded(pointRun.result());
     }
     journal.complete();

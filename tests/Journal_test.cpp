@@ -57,9 +57,10 @@ TEST_F(JournalFiles, LeaveEarlierResultsUntilThereAreNewOnes)
 {
     folder.write("results.csv", "of last year");
     Journal journal(plan, output, Earlier::refuse);
-    journal.keep(resultOf(0, 10));
+    journal.save(resultOf(0, 10));
     EXPECT_EQ(folder.read("results.csv"), "of last year");
     journal.end(resultOf(0, 20));
+    journal.save(std::nullopt);
     EXPECT_EQ(folder.read("results.csv"), csvText(resultsOf(plan, {resultOf(0, 20)})));
 }
 
@@ -76,7 +77,7 @@ TEST_F(JournalFiles, AreTheResultsAloneAtLast)
 TEST_F(JournalFiles, AreNotNeeded)
 {
     Journal journal(plan, "", Earlier::refuse);
-    journal.keep(resultOf(0, 10));
+    journal.save(resultOf(0, 10));
     journal.end(resultOf(0, 20));
     journal.complete();
     EXPECT_EQ(journal.ended().size(), 1U);
@@ -88,7 +89,7 @@ TEST_F(JournalFiles, TellHowFarARunHasCome)
     {
         Journal journal(plan, output, Earlier::refuse);
         journal.end(resultOf(0, 20));
-        journal.keep(resultOf(1, 7));
+        journal.save(resultOf(1, 7));
     }
     const Journal journal(plan, output, Earlier::resume);
     EXPECT_TRUE(journal.isResumed());
@@ -109,7 +110,7 @@ TEST_F(JournalFiles, AreNotLostToAnotherRun)
 {
     {
         Journal journal(plan, output, Earlier::refuse);
-        journal.keep(resultOf(0, 10));
+        journal.save(resultOf(0, 10));
     }
     const std::string before = folder.read("results.csv.checkpoint");
     EXPECT_EQ(refusal(Earlier::refuse),

@@ -1,0 +1,340 @@
+// morvik ber and merge: runs in parts, by any number of threads, stopped, killed and resumed end in the same files.
+#include <fcntl.h>
+#include <signal.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <fstream>
+#include <thread>
+
+#include "support/BerTest.h"
+
+namespace {
+
+using namespace support;
+
+/// Many short points of two block sizes, which end by all kinds of rules.
+const Arguments manyPoints = {"--block-size",
+                              "40,104",
+                              "--ebn0",
+                              "0:0.2:3.6",
+                              "--max-blocks",
+                              "30000",
+                              "--block-errors",
+                              "700",
+                              "--bit-errors",
+                              "4000",
+                              "--iterations",
+                              "4"};
+
+/// A point that takes a while.
+const Arguments longPoint = {"--block-size", "512", "--ebn0", "1.4", "--frames", "0:40000"};
+
+/// A point with as many frames as some batches have.
+const Arguments shortPoint = {"--block-size", "512", "--ebn0", "0.7", "--frames", "0:5000"};
+
+class BerRuns : public BerTest {
+protected:
+    /// Starts a run that writes results.csv, in silence.
+    Process start(const Arguments& arguments) const
+    {
+        const int silent = open("/dev/null", O_RDWR | O_CLOEXEC);
+        const int messages =
+            open((morvik.directory() + "/messages").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+        const int streams[] = {silent, silent, messages};
+        Process process(
+            morvik.program(),
+            Arguments{"ber", "--quiet", "--output", "results.csv", "--checkpoint-interval", "0.01", "--threads", "1"} +
+                arguments,
+            morvik.directory(),
+            streams);
+        close(silent);
+        close(messages);
+        return process;
+    }
+
+    /// Waits until the checkpoint holds a text; false after a minute.
+    bool waitForCheckpoint(const std::string& text) const
+    {
+        for (int i = 0; i < 6000; ++i) {
+            std::ifstream file(morvik.directory() + "/results.csv.checkpoint");
+            const std::string content(std::istreambuf_iterator<char>(file), {});
+            if (content.find(text) != std::string::npos) {
+                return true;
+            }
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        }
+        return false;
+    }
+
+    /// Resumes the run of results.csv to its end, and returns that without times.
+    std::string resume(const Arguments& arguments) const
+    {
+        return berFile(arguments + Arguments{"--resume"});
+    }
+
+    std::string checkpoint() const
+    {
+        return morvik.read("results.csv.checkpoint");
+    }
+};
+
+// ---- The same files, however they are made
+
+TEST_F(BerRuns, GiveTheSameFilesForAnyNumberOfThreads)
+{
+    const Arguments eachIteration = shortPoint + Arguments{"--iterations", "3", "--each-iteration"};
+    for (const auto& [file, run] : {std::pair("a.csv", manyPoints),
+                                    std::pair("a.csv", eachIteration),
+                                    std::pair("a.json", shortPoint),
+                                    std::pair("a.json", eachIteration)}) {
+        const std::string one = berFile(run + Arguments{"--threads", "1"}, file);
+        EXPECT_EQ(berFile(run + Arguments{"--threads", "2"}, file), one);
+        EXPECT_EQ(berFile(run + Arguments{"--threads", "3"}, file), one);
+        EXPECT_EQ(berFile(run, file), one);
+    }
+}
+
+TEST_F(BerRuns, GiveTheSameFilesWithEachInstructionSet)
+{
+    const Arguments run = {
+        "--block-size", "40,1024", "--num-pu", "2,4,8", "--algorithm", "0,1,2", "--ebn0", "0.5", "--frames", "0:40"};
+    const std::string best = berFile(run);
+    int sets = 0;
+    for (const std::string name : {"component", "generic", "ssse3", "avx2", "avx512"}) {
+        const Arguments choice = run + Arguments{"--instruction-set", name};
+        if (morvik.run(Arguments{"ber", "--max-blocks", "1"} + choice).status == 0) {
+            EXPECT_EQ(berFile(choice), best) << name;
+            ++sets;
+        }
+    }
+    EXPECT_GE(sets, 2);
+}
+
+// The same on every machine and for both word sizes. tests/data/ber/README.md tells how they were made.
+TEST_F(BerRuns, GiveTheFilesThatAreKept)
+{
+    for (const std::string name : {"sweep.csv", "scales.csv", "each_iteration.csv", "each_iteration.json"}) {
+        const std::string folder = std::string(MORVIK_TEST_DATA) + "/ber/";
+        std::ifstream commands(folder + "commands.txt");
+        int found = 0;
+        for (std::string line; std::getline(commands, line);) {
+            std::istringstream words(line);
+            std::string word;
+            Arguments arguments;
+            while (words >> word) {
+                arguments.push_back(word);
+            }
+            if (!arguments.empty() && arguments.front() == name) {
+                arguments.erase(arguments.begin());
+                EXPECT_EQ(berFile(arguments, name), morvik.read(folder + name));
+                ++found;
+            }
+        }
+        EXPECT_EQ(found, 1) << name;
+    }
+}
+
+// ---- Runs that are stopped
+
+TEST_F(BerRuns, ThatAreKilledAgainAndAgainEndInTheSameFile)
+{
+    const std::string expected = berFile(manyPoints, "expected.csv");
+    // Killed when so many points have ended, or soon after: in the middle of the work on files, at times.
+    int kills = 0;
+    for (const std::string point : {"3", "10", "17", "24"}) {
+        Process process = start(manyPoints + (kills > 0 ? Arguments{"--resume"} : Arguments{}));
+        ASSERT_TRUE(waitForCheckpoint("\"number\": " + point + ","));
+        process.send(SIGKILL);
+        EXPECT_EQ(process.wait(), -SIGKILL);
+        ++kills;
+    }
+    EXPECT_EQ(resume(manyPoints), expected);
+    EXPECT_EQ(morvik.names(), (Arguments{"expected.csv", "messages", "results.csv"}));
+}
+
+TEST_F(BerRuns, ThatAreKilledLoseNoCheckpoint)
+{
+    const std::string expected = berFile(longPoint, "expected.csv");
+    Process process = start(longPoint);
+    ASSERT_TRUE(waitForCheckpoint("\"running\""));
+    process.send(SIGKILL);
+    EXPECT_EQ(process.wait(), -SIGKILL);
+    EXPECT_NE(checkpoint().find("\"running\""), std::string::npos);
+    EXPECT_EQ(resume(longPoint), expected);
+}
+
+TEST_F(BerRuns, EndBySignalsWithACheckpoint)
+{
+    const std::string expected = berFile(longPoint, "expected.csv");
+    for (const int signal : {SIGINT, SIGTERM, SIGHUP}) {
+        Process process = start(longPoint);
+        ASSERT_TRUE(waitForCheckpoint("\"running\""));
+        process.send(signal);
+        EXPECT_EQ(process.wait(), 128 + signal);
+        EXPECT_EQ(morvik.read("messages"), "morvik ber: interrupted, --resume goes on from results.csv.checkpoint\n");
+        EXPECT_EQ(resume(longPoint), expected);
+        EXPECT_EQ(morvik.names(), (Arguments{"expected.csv", "messages", "results.csv"}));
+    }
+}
+
+TEST_F(BerRuns, ThatIgnoreSignalsGoOnIgnoringThem)
+{
+    const CommandRunner shell("/bin/sh");
+    const CommandResult result = shell.run({"-c",
+                                            "trap '' INT; \"$@\" & kill -INT $!; wait $!",
+                                            "sh",
+                                            morvik.program(),
+                                            "ber",
+                                            "--block-size",
+                                            "40",
+                                            "--ebn0",
+                                            "0",
+                                            "--max-blocks",
+                                            "10",
+                                            "--quiet",
+                                            "--output",
+                                            "a.csv"});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(csvRows(shell.read("a.csv")).size(), 1U);
+}
+
+TEST_F(BerRuns, WithoutAnOutputEndBySignalsToo)
+{
+    const CommandRunner shell("/bin/sh");
+    const CommandResult result = shell.run({"-c",
+                                            "\"$@\" & sleep 0.3; kill -TERM $!; wait $!",
+                                            "sh",
+                                            morvik.program(),
+                                            "ber",
+                                            "--block-size",
+                                            "40",
+                                            "--ebn0",
+                                            "50",
+                                            "--max-blocks",
+                                            "1000000000000"});
+    EXPECT_EQ(result.status, 128 + SIGTERM);
+    EXPECT_EQ(result.err, "morvik ber: interrupted\n");
+}
+
+TEST_F(BerRuns, ThatFillTheDiskLoseNothing)
+{
+    const std::string expected = berFile(manyPoints, "expected.csv");
+    // The shell counts blocks of 512 or of 1024 bytes: room for the first points, but not for all.
+    const CommandResult result = CommandRunner("/bin/sh").run(Arguments{"-c",
+                                                                        "cd \"$1\"; shift; ulimit -f 4; exec \"$@\"",
+                                                                        "sh",
+                                                                        morvik.directory(),
+                                                                        morvik.program(),
+                                                                        "ber",
+                                                                        "--quiet",
+                                                                        "--output",
+                                                                        "results.csv",
+                                                                        "--checkpoint-interval",
+                                                                        "0.001"} +
+                                                              manyPoints);
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "morvik ber: results.csv.checkpoint: cannot be written: File too large\n");
+    EXPECT_EQ(morvik.names(), (Arguments{"expected.csv", "results.csv", "results.csv.checkpoint"}));
+    EXPECT_GE(csvRows(morvik.read("results.csv")).size(), 2U);
+    EXPECT_EQ(resume(manyPoints), expected);
+}
+
+TEST_F(BerRuns, ResumeFromTheBeginningWhereThereIsNothing)
+{
+    const Arguments run = {"--block-size", "40", "--ebn0", "0", "--max-blocks", "10"};
+    const std::string expected = berFile(run);
+    const CommandResult result = morvik.run(Arguments{"ber", "--quiet", "--output", "new.csv", "--resume"} + run);
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.err, "morvik ber: no new.csv.checkpoint to go on from, starts from the beginning\n");
+    EXPECT_EQ(withoutTimes(morvik.read("new.csv")), expected);
+}
+
+TEST_F(BerRuns, ResumeNoOtherRun)
+{
+    Process process = start(longPoint);
+    ASSERT_TRUE(waitForCheckpoint("\"running\""));
+    process.send(SIGTERM);
+    process.wait();
+    const std::string kept = checkpoint();
+    const Arguments again = Arguments{"ber", "--quiet", "--output", "results.csv"} + longPoint;
+    const std::string place = "morvik ber: results.csv.checkpoint: ";
+    expectRefused(again, place + "holds an unfinished run; go on with it by --resume, or remove it");
+    for (const Arguments& other : {Arguments{"--seed", "2"},
+                                   Arguments{"--scale", "8"},
+                                   Arguments{"--num-pu", "2"},
+                                   Arguments{"--block-errors", "100000"},
+                                   Arguments{"--each-iteration"}}) {
+        expectRefused(
+            again + other + Arguments{"--resume"},
+            place +
+                "holds a run with other parameters: morvik ber --block-size 512 --num-pu 4 --algorithm scaled "
+                "--scale auto --iterations 8 --ebn0 1.4 --stop-bler 0 --frames 0:40000 --seed 1");
+    }
+    EXPECT_EQ(checkpoint(), kept);
+
+    for (const std::string& damaged : {kept.substr(0, kept.size() / 2), kept + "x", std::string()}) {
+        morvik.write("results.csv.checkpoint", damaged);
+        expectRefused(again + Arguments{"--resume"},
+                      place + "is damaged and cannot be resumed; remove it to start anew");
+        EXPECT_EQ(checkpoint(), damaged);
+    }
+}
+
+TEST_F(BerRuns, FindOutThatTheirOutputCannotBeWrittenBeforeTheyStart)
+{
+    const Arguments run = Arguments{"ber"} + manyPoints + Arguments{"--output"};
+    expectRefused(run + Arguments{"none/a.csv"},
+                  "morvik ber: none/a.csv: cannot be written: No such file or directory");
+    expectRefused(run + Arguments{"a.txt"},
+                  "morvik ber: a.txt: is no name for results, allowed are names that end in .csv or .json");
+    expectRefused(run + Arguments{"-"},
+                  "morvik ber: -: is no name for results, allowed are names that end in .csv or .json");
+    EXPECT_EQ(morvik.names(), Arguments{});
+}
+
+// ---- Runs in parts
+
+TEST_F(BerRuns, InPartsAreJoinedToTheWhole)
+{
+    const Arguments run = {
+        "--block-size", "40,104", "--ebn0", "0:0.5:2", "--iterations", "3", "--each-iteration", "--frames"};
+    const std::string whole = berFile(run + Arguments{"0:2000"}, "whole.csv");
+    const std::string wholeJson = berFile(run + Arguments{"0:2000"}, "whole.json");
+    berFile(run + Arguments{"0:700"}, "a.csv");
+    berFile(run + Arguments{"700:701"}, "b.json");
+    berFile(run + Arguments{"701:2000"}, "c.csv");
+    const CommandResult printed = morvik.run({"merge", "c.csv", "a.csv", "b.json"});
+    EXPECT_EQ(printed.status, 0) << printed.err;
+    EXPECT_EQ(withoutTimes(printed.out), whole);
+    const CommandResult written = morvik.run({"merge", "a.csv", "b.json", "c.csv", "--output", "all.json"});
+    EXPECT_EQ(written.status, 0) << written.err;
+    EXPECT_EQ(written.out, "");
+    const std::string json = withoutTimes(morvik.read("all.json"));
+    EXPECT_EQ(json.substr(json.find("\"rows\"")), wholeJson.substr(wholeJson.find("\"rows\"")));
+    EXPECT_NE(json.find("\"command\": \"morvik merge a.csv b.json c.csv\""), std::string::npos);
+}
+
+TEST_F(BerRuns, ThatShareFramesAreNotJoined)
+{
+    const Arguments run = {"--block-size", "40", "--ebn0", "0", "--frames"};
+    berFile(run + Arguments{"0:100"}, "a.csv");
+    berFile(run + Arguments{"99:200"}, "b.csv");
+    expectRefused(
+        {"merge", "a.csv", "b.csv"},
+        "morvik merge: b.csv: has frames that a.csv has, too: K = 40, 4 units, scaled, scale 8, 8 iterations, 0 "
+        "dB, frames 99:200");
+    berFile(run + Arguments{"100:200", "--seed", "2"}, "b.csv");
+    expectRefused({"merge", "a.csv", "b.csv", "--output", "c.csv"},
+                  "morvik merge: b.csv: has seed 2, but a.csv has 1; only results of the same seed are joined");
+    morvik.write("b.csv", "block,rsc1_sys\n");
+    const CommandResult noResults = morvik.run({"merge", "a.csv", "b.csv"});
+    EXPECT_EQ(noResults.status, 2);
+    EXPECT_EQ(noResults.err.substr(0, 40), "morvik merge: b.csv:1: no header of a re");
+    expectRefused({"merge", "a.csv", "none.csv"},
+                  "morvik merge: none.csv: cannot be opened: No such file or directory");
+    EXPECT_EQ(morvik.names(), (Arguments{"a.csv", "b.csv"}));
+}
+
+}  // namespace
