@@ -18,6 +18,13 @@ std::uint32_t framesAtOnce(unsigned blockSize)
     return std::max(1024 / blockSize, 1U) * 64;
 }
 
+void expectSuccess(std::int32_t status)
+{
+    if (status != 0) {
+        throw std::runtime_error("the decoder has refused a block");
+    }
+}
+
 }  // namespace
 
 FrameSimulator::FrameSimulator(const Plan& plan, std::string instructionSet)
@@ -41,10 +48,16 @@ bool FrameSimulator::proceed(BatchResult& result)
         return false;
     }
     prepareFor(result.batch.point);
-    const unsigned K = itsPlan.points[result.batch.point].blockSize;
-    const std::uint32_t count = std::min(framesAtOnce(K), result.batch.count - done);
+    const Point& point = itsPlan.points[result.batch.point];
+    const std::uint32_t count = std::min(framesAtOnce(point.blockSize), result.batch.count - done);
     itsSource->make(result.batch.first + done, count, itsFrames);
-    appendWrongBits(result.batch.point, count, result.wrongBits);
+    const std::size_t counted = result.wrongBits.size();
+    result.wrongBits.resize(counted + count * itsPlan.countsOf(point));
+    if (itsPlan.eachIteration) {
+        countWrongBitsOfEachIteration(point, count, &result.wrongBits[counted]);
+    } else {
+        countWrongBits(point, count, &result.wrongBits[counted]);
+    }
     result.clipped.insert(result.clipped.end(), itsFrames.clipped.begin(), itsFrames.clipped.end());
     return true;
 }
@@ -82,44 +95,46 @@ void FrameSimulator::makeDecoder(const Point& point)
     }
 }
 
-void FrameSimulator::appendWrongBits(std::size_t number, std::uint32_t count, std::vector<std::uint32_t>& wrongBits)
-{
-    const Point& point = itsPlan.points[number];
-    const std::size_t counts = itsPlan.countsOf(point);
-    const std::size_t start = wrongBits.size();
-    wrongBits.resize(start + count * counts);
-    for (std::size_t i = 0; i < counts; ++i) {
-        decode(point, point.iterations - static_cast<unsigned>(counts - 1 - i), count);
-        for (std::uint32_t frame = 0; frame < count; ++frame) {
-            const auto* const sent = &itsFrames.sent[std::size_t{frame} * point.blockSize];
-            const auto* const decided = &itsDecided[std::size_t{frame} * point.blockSize];
-            std::uint32_t wrong = 0;
-            for (unsigned bit = 0; bit < point.blockSize; ++bit) {
-                wrong += sent[bit] ^ decided[bit];
-            }
-            wrongBits[start + frame * counts + i] = wrong;
-        }
-    }
-}
-
-void FrameSimulator::decode(const Point& point, unsigned iterations, std::uint32_t count)
+void FrameSimulator::countWrongBits(const Point& point, std::uint32_t count, std::uint32_t* wrongBits)
 {
     itsDecided.resize(std::size_t{count} * point.blockSize);
     veltra_ip_morvik_v1_0_batch_outputs outputs = {};
     outputs.dout = itsDecided.data();
     outputs.dout_alloc = itsDecided.size();
-    const std::int32_t status = veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.get(),
-                                                                        itsFrames.streams[0].data(),
-                                                                        itsFrames.streams[1].data(),
-                                                                        itsFrames.streams[2].data(),
-                                                                        static_cast<std::int32_t>(point.blockSize + 4),
-                                                                        count,
-                                                                        iterations,
-                                                                        nullptr,
-                                                                        &outputs);
-    if (status != 0) {
-        throw std::runtime_error("the decoder has refused a block");
+    expectSuccess(veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.get(),
+                                                          itsFrames.streams[0].data(),
+                                                          itsFrames.streams[1].data(),
+                                                          itsFrames.streams[2].data(),
+                                                          static_cast<std::int32_t>(point.blockSize + 4),
+                                                          count,
+                                                          point.iterations,
+                                                          nullptr,
+                                                          &outputs));
+    const std::uint8_t* sent = itsFrames.sent.data();
+    const std::uint8_t* decided = itsDecided.data();
+    for (std::uint32_t frame = 0; frame < count; ++frame) {
+        std::uint32_t wrong = 0;
+        for (unsigned bit = 0; bit < point.blockSize; ++bit) {
+            wrong += sent[bit] ^ decided[bit];
+        }
+        wrongBits[frame] = wrong;
+        sent += point.blockSize;
+        decided += point.blockSize;
     }
+}
+
+void FrameSimulator::countWrongBitsOfEachIteration(const Point& point, std::uint32_t count, std::uint32_t* wrongBits)
+{
+    expectSuccess(veltra_ip_morvik_v1_0_batch_count_errors_i8(itsDecoder.get(),
+                                                              itsFrames.streams[0].data(),
+                                                              itsFrames.streams[1].data(),
+                                                              itsFrames.streams[2].data(),
+                                                              static_cast<std::int32_t>(point.blockSize + 4),
+                                                              count,
+                                                              point.iterations,
+                                                              itsFrames.sent.data(),
+                                                              wrongBits,
+                                                              std::size_t{count} * point.iterations));
 }
 
 }  // namespace simulation

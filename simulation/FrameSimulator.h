@@ -42,8 +42,8 @@ private:
 
     void prepareFor(std::size_t point);
     void makeDecoder(const Point& point);
-    void appendWrongBits(std::size_t point, std::uint32_t count, std::vector<std::uint32_t>& wrongBits);
-    void decode(const Point& point, unsigned iterations, std::uint32_t count);
+    void countWrongBits(const Point& point, std::uint32_t count, std::uint32_t* wrongBits);
+    void countWrongBitsOfEachIteration(const Point& point, std::uint32_t count, std::uint32_t* wrongBits);
 
     const Plan& itsPlan;
     std::string itsInstructionSet;
