@@ -67,18 +67,18 @@ const morvik::link::Frames& FrameSimulator::frames() const
     return itsFrames;
 }
 
-void FrameSimulator::prepareFor(std::size_t number)
+void FrameSimulator::prepareFor(std::size_t point)
 {
-    if (itsPoint == number) {
+    if (itsPoint == point) {
         return;
     }
-    const Point& point = itsPlan.points[number];
-    if (!itsPoint || point.numPu != itsPlan.points[*itsPoint].numPu ||
-        point.algorithm != itsPlan.points[*itsPoint].algorithm) {
-        makeDecoder(point);
+    const Point& next = itsPlan.points[point];
+    if (!itsPoint || next.numPu != itsPlan.points[*itsPoint].numPu ||
+        next.algorithm != itsPlan.points[*itsPoint].algorithm) {
+        makeDecoder(next);
     }
-    itsSource.emplace(point.blockSize, point.milliDecibels, fromThousandths(point.milliScale), itsPlan.seed);
-    itsPoint = number;
+    itsSource.emplace(next.blockSize, next.milliDecibels, fromThousandths(next.milliScale), itsPlan.seed);
+    itsPoint = point;
 }
 
 void FrameSimulator::makeDecoder(const Point& point)

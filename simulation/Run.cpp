@@ -110,7 +110,8 @@ private:
     /// Batches grow with the point: one that ends early shall not have many frames handed out for nothing.
     std::uint32_t batchSize() const
     {
-        const std::uint64_t share = (itsNext - itsPlan.frames.from) / (2 * batchesAhead * itsParts.workers.count());
+        const std::uint64_t share =
+            (itsNext - itsPlan.frames.from) / (std::uint64_t{2} * batchesAhead * itsParts.workers.count());
         const std::uint64_t size = std::clamp<std::uint64_t>(share, smallestBatch, itsLargestBatch);
         return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch);
     }

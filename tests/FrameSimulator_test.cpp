@@ -72,7 +72,8 @@ std::map<std::size_t, BatchResult> takeAll(Workers& workers, std::size_t batches
     for (int patience = 0; results.size() < batches && patience < 6000; ++patience) {
         auto result = workers.take(std::chrono::milliseconds(100));
         if (result) {
-            results.emplace(result->batch.point, *std::move(result));
+            const std::size_t point = result->batch.point;
+            results.emplace(point, *std::move(result));
         }
     }
     return results;

@@ -20,6 +20,16 @@ std::vector<std::string> fieldsOf(const std::string& line)
 
 }  // namespace
 
+Arguments words(const std::string& text)
+{
+    std::istringstream stream(text);
+    Arguments words;
+    for (std::string word; stream >> word;) {
+        words.push_back(word);
+    }
+    return words;
+}
+
 Arguments operator+(Arguments first, const Arguments& second)
 {
     first.insert(first.end(), second.begin(), second.end());

@@ -12,6 +12,9 @@ namespace support {
 
 using Arguments = std::vector<std::string>;
 
+/// The words of a text.
+Arguments words(const std::string& text);
+
 /// Both lists, one after the other.
 Arguments operator+(Arguments first, const Arguments& second);
 
