@@ -61,12 +61,12 @@ private:
 /// The simulation of one point.
 class PointRun {
 public:
-    PointRun(const Plan& plan, const RunParts& parts, Saving& saving, PointResult result)
+    PointRun(const Plan& plan, const RunParts& parts, Saving& saving, const PointResult& result)
         : itsPlan(plan),
           itsParts(parts),
           itsSaving(saving),
           itsResult(result),
-          itsCount(plan.rules, plan.frames, std::move(result.tally)),
+          itsCount(plan.rules, plan.frames, result.tally),
           itsLargestBatch(largestBatch(plan.points[result.number])),
           itsNext(plan.frames.from + itsResult.tally.blocks)
     {
