@@ -51,13 +51,12 @@ void checkInstructionSet(const std::string& name)
 int simulate(const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
+    std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
-    if (options.resume && !journal.isResumed()) {
-        std::cerr << "morvik ber: no " << journal.checkpointName() << " to go on from, starts from the beginning"
-                  << std::endl;
+    if (options.resume && journal.isEmpty()) {
+        std::cerr << "morvik ber: nothing to resume, starts from the beginning" << std::endl;
     }
     const unsigned threads = options.threads > 0 ? options.threads : std::max(std::thread::hardware_concurrency(), 1U);
-    std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     const Interruption interruption;
     bool isComplete = false;
     {

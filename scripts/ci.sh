@@ -77,8 +77,9 @@ stage_memory() {
 }
 
 stage_threads() {
-    scripts/build threads threads_test
+    scripts/build threads threads_test simulation_test
     build/threads/tests/threads_test --gtest_brief=1
+    build/threads/tests/simulation_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
 }
 
 # Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead;

@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "AtomicFile.h"
+#include "CompleteResults.h"
 #include "Error.h"
 #include "ResultFiles.h"
 #include "TextFile.h"
@@ -22,13 +23,22 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     }
     formatOf(itsOutput);
     checkWritable(itsOutput);
-    readCheckpoint(earlier);
+    const std::string checkpointFile = checkpointName();
+    const bool isUnfinished = std::filesystem::exists(checkpointFile);
+    if (isUnfinished && earlier == Earlier::refuse) {
+        throw Error(checkpointFile + ": holds an unfinished run; go on with it by --resume, or remove it");
+    }
+    if (isUnfinished) {
+        resume(checkpointFile);
+    } else if (earlier == Earlier::resume && std::filesystem::exists(itsOutput)) {
+        takeComplete();
+    }
     save(itsCheckpoint.running);
 }
 
-bool Journal::isResumed() const
+bool Journal::isEmpty() const
 {
-    return itsIsResumed;
+    return itsCheckpoint.ended.empty() && !itsCheckpoint.running;
 }
 
 const std::vector<PointResult>& Journal::ended() const
@@ -76,27 +86,29 @@ std::string Journal::checkpointName() const
     return itsOutput + ".checkpoint";
 }
 
-void Journal::readCheckpoint(Earlier earlier)
+void Journal::resume(const std::string& checkpointFile)
 {
-    const std::string name = checkpointName();
-    if (!std::filesystem::exists(name)) {
-        return;
-    }
-    if (earlier == Earlier::refuse) {
-        throw Error(name + ": holds an unfinished run; go on with it by --resume, or remove it");
-    }
-    const auto checkpoint = parseCheckpoint(readText(name));
+    const auto checkpoint = parseCheckpoint(readText(checkpointFile));
     if (!checkpoint) {
-        throw Error(name + ": is damaged and cannot be resumed; remove it to start anew");
+        throw Error(checkpointFile + ": is damaged and cannot be resumed; remove it to start anew");
     }
     if (checkpoint->version != itsPlan.version) {
-        throw Error(name + ": holds a run of version " + checkpoint->version + ", this is " + itsPlan.version);
+        throw Error(checkpointFile + ": holds a run of version " + checkpoint->version + ", this is " +
+                    itsPlan.version);
     }
     if (checkpoint->command != itsPlan.command) {
-        throw Error(name + ": holds a run with other parameters: " + checkpoint->command);
+        throw Error(checkpointFile + ": holds a run with other parameters: " + checkpoint->command);
     }
     itsCheckpoint = *checkpoint;
-    itsIsResumed = true;
+}
+
+void Journal::takeComplete()
+{
+    const auto points = pointsOfComplete(itsPlan, readResults(itsOutput));
+    if (!points) {
+        throw Error(itsOutput + ": holds other results, and there is no checkpoint to resume; remove it to start anew");
+    }
+    itsCheckpoint.ended = *points;
 }
 
 }  // namespace simulation

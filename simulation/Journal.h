@@ -16,15 +16,16 @@ namespace simulation {
 /// there as a whole whenever the process is killed, as they were saved last. All functions throw Error.
 class Journal {
 public:
-    /// What becomes of an earlier, unfinished run's checkpoint: it is in the way, or this run goes on from it.
+    /// What becomes of an earlier run: its checkpoint is in the way, or this run goes on from it. A complete run has no
+    /// checkpoint, but results; going on from there, nothing is left to do.
     enum class Earlier { refuse, resume };
 
     /// Opens the journal, and finds out whether it can be kept. Without an output it is kept in memory alone. The plan
     /// outlives the journal.
     Journal(const Plan& plan, std::string output, Earlier earlier);
 
-    /// Whether there is a checkpoint that the run goes on from.
-    bool isResumed() const;
+    /// Whether nothing has been counted yet.
+    bool isEmpty() const;
 
     /// The points that have ended, in the order of the plan.
     const std::vector<PointResult>& ended() const;
@@ -45,11 +46,11 @@ public:
     std::string checkpointName() const;
 
 private:
-    void readCheckpoint(Earlier earlier);
+    void resume(const std::string& checkpointFile);
+    void takeComplete();
 
     const Plan& itsPlan;
     std::string itsOutput;
-    bool itsIsResumed = false;
     Checkpoint itsCheckpoint;
     std::size_t itsResultsSaved = 0;  // how many points the results had when they were written last
 };

@@ -51,6 +51,18 @@ std::vector<std::string> splitAt(char separator, const std::string& line)
     return fields;
 }
 
+/// Throws Error unless the row's numbers of errors are possible, so that rates and bounds can be computed.
+void checkCounts(const ResultRow& row, const std::string& place)
+{
+    const ErrorCounts& errors = row.errors;
+    const std::uint64_t blocks = row.frames.size();
+    const std::uint64_t bits = blocks * row.point.blockSize;
+    if (errors.blockErrors > blocks || errors.bitErrors < errors.blockErrors || errors.bitErrors > bits ||
+        errors.bitErrorSquares < errors.bitErrors || errors.failures.size() > errors.blockErrors) {
+        throw Error(place + ": numbers of errors that cannot be");
+    }
+}
+
 ResultRow csvRow(const std::string& line, const std::string& place)
 {
     const std::vector<std::string> fields = splitAt(',', line);
@@ -62,6 +74,7 @@ ResultRow csvRow(const std::string& line, const std::string& place)
     for (std::size_t i = 0; i < fields.size(); ++i) {
         readField(columns()[i], fields[i], row, place);
     }
+    checkCounts(row, place);
     return row;
 }
 
@@ -108,6 +121,7 @@ Results parseJson(const std::string& text, const std::string& fileName)
             for (const Column& column : columns()) {
                 readField(column, jsonField(object.at(std::string(column.name)), column.kind), row, place);
             }
+            checkCounts(row, place);
             results.rows.push_back(row);
         }
     } catch (const nlohmann::json::exception& error) {

@@ -97,9 +97,9 @@ private:
     {
         const unsigned workers = itsParts.workers.count();
         const std::uint64_t counted = itsPlan.frames.from + itsCount.tally().blocks;
-        const std::uint64_t furthest = counted + std::uint64_t{batchesWaiting} * workers * itsLargestBatch;
-        const std::uint64_t end = std::min(furthest, lastFrame());
-        while (itsBatchesOut < batchesAhead * workers && itsNext < end) {
+        const std::uint64_t furthestAhead = std::uint64_t{batchesWaiting} * workers * itsLargestBatch;
+        const std::uint64_t end = frameEnd();
+        while (itsBatchesOut < batchesAhead * workers && itsNext < end && itsNext - counted < furthestAhead) {
             const auto count = static_cast<std::uint32_t>(std::min<std::uint64_t>(batchSize(), end - itsNext));
             itsParts.workers.handOut({itsResult.number, itsNext, count});
             itsNext += count;
@@ -113,11 +113,12 @@ private:
         const std::uint64_t share =
             (itsNext - itsPlan.frames.from) / (std::uint64_t{2} * batchesAhead * itsParts.workers.count());
         const std::uint64_t size = std::clamp<std::uint64_t>(share, smallestBatch, itsLargestBatch);
-        return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch);
+        const std::uint64_t unaligned = itsNext % smallestBatch;  // of a run that was resumed anywhere
+        return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch - unaligned);
     }
 
-    /// The frame that surely need not be simulated any more.
-    std::uint64_t lastFrame() const
+    /// The first frame that surely does not count.
+    std::uint64_t frameEnd() const
     {
         const FrameRange& frames = itsPlan.frames;
         const std::uint64_t most = itsPlan.rules.maxBlocks.value_or(UINT64_MAX);

@@ -48,7 +48,7 @@ protected:
 TEST_F(JournalFiles, AreACheckpointAtFirst)
 {
     const Journal journal(plan, output, Earlier::refuse);
-    EXPECT_FALSE(journal.isResumed());
+    EXPECT_TRUE(journal.isEmpty());
     EXPECT_EQ(folder.names(), Names{"results.csv.checkpoint"});
     EXPECT_EQ(journal.resultSoFar(1).tally.blocks, 0U);
 }
@@ -92,7 +92,7 @@ TEST_F(JournalFiles, TellHowFarARunHasCome)
         journal.save(resultOf(1, 7));
     }
     const Journal journal(plan, output, Earlier::resume);
-    EXPECT_TRUE(journal.isResumed());
+    EXPECT_FALSE(journal.isEmpty());
     ASSERT_EQ(journal.ended().size(), 1U);
     support::expectEqual(journal.ended()[0].tally, resultOf(0, 20).tally);
     support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 7).tally);
@@ -102,8 +102,56 @@ TEST_F(JournalFiles, TellHowFarARunHasCome)
 TEST_F(JournalFiles, ResumeFromTheBeginningWithoutACheckpoint)
 {
     const Journal journal(plan, output, Earlier::resume);
-    EXPECT_FALSE(journal.isResumed());
+    EXPECT_TRUE(journal.isEmpty());
     EXPECT_TRUE(journal.ended().empty());
+}
+
+TEST_F(JournalFiles, OfACompleteRunHaveNothingLeftToDo)
+{
+    plan.rules.maxBlocks = 20;
+    {
+        Journal journal(plan, output, Earlier::refuse);
+        journal.end(resultOf(0, 20));
+        journal.end(resultOf(1, 20));
+        journal.complete();
+    }
+    const std::string results = folder.read("results.csv");
+    {
+        Journal journal(plan, output, Earlier::resume);
+        EXPECT_EQ(journal.ended().size(), 2U);
+        journal.complete();
+    }
+    EXPECT_EQ(folder.read("results.csv"), results);
+    EXPECT_EQ(folder.names(), Names{"results.csv"});
+}
+
+TEST_F(JournalFiles, KeepOtherResultsFromAnAttemptToResume)
+{
+    plan.rules.maxBlocks = 20;
+    const auto expectRefused = [this] {
+        const std::string before = folder.read("results.csv");
+        EXPECT_EQ(refusal(Earlier::resume),
+                  output + ": holds other results, and there is no checkpoint to resume; remove it to start anew");
+        EXPECT_EQ(folder.read("results.csv"), before);
+        EXPECT_EQ(folder.names(), Names{"results.csv"});
+    };
+    const std::vector<PointResult> points = {resultOf(0, 20), resultOf(1, 20)};
+    writeResults(output, resultsOf(plan, {points[0]}));
+    expectRefused();  // a part of it
+    writeResults(output, resultsOf(plan, {points[0], resultOf(1, 19)}));
+    expectRefused();
+    Plan other = plan;
+    other.seed = 2;
+    writeResults(output, resultsOf(other, points));
+    expectRefused();
+    other = plan;
+    other.frames.from = 20;
+    writeResults(output, resultsOf(other, points));
+    expectRefused();
+    other = plan;
+    other.points = pointsOf({{40}, {4}, {1}, {std::nullopt}, {8}, {0, 500, 1000}});
+    writeResults(output, resultsOf(other, {points[0], points[1], resultOf(2, 20)}));
+    expectRefused();
 }
 
 TEST_F(JournalFiles, AreNotLostToAnotherRun)

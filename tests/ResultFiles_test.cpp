@@ -130,6 +130,17 @@ TEST_F(ResultFiles, WithMistakesAreRefusedWithTheirPlaces)
     EXPECT_EQ(refusal("a.csv", csvWith(",1.2.3", ",")), "a.csv:2: version \"\" is not allowed");
 }
 
+TEST_F(ResultFiles, WithImpossibleCountsAreRefused)
+{
+    const std::string cannotBe = "a.csv:2: numbers of errors that cannot be";
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,41,196,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",3,4,196,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",1601,4,1601,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,27,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,3,196,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,28,")), "none");
+}
+
 TEST_F(ResultFiles, OfBrokenJsonAreRefused)
 {
     const std::string whole = jsonText(exampleResults());

@@ -225,7 +225,7 @@ TEST_F(BerRuns, ResumeFromTheBeginningWhereThereIsNothing)
     const std::string expected = berFile(run);
     const CommandResult result = morvik.run(Arguments{"ber", "--quiet", "--output", "new.csv", "--resume"} + run);
     EXPECT_EQ(result.status, 0);
-    EXPECT_EQ(result.err, "morvik ber: no new.csv.checkpoint to go on from, starts from the beginning\n");
+    EXPECT_EQ(result.err, "morvik ber: nothing to resume, starts from the beginning\n");
     EXPECT_EQ(withoutTimes(morvik.read("new.csv")), expected);
 }
 
@@ -270,6 +270,22 @@ TEST_F(BerRuns, FindOutThatTheirOutputCannotBeWrittenBeforeTheyStart)
     expectRefused(run + Arguments{"-"},
                   "morvik ber: -: is no name for results, allowed are names that end in .csv or .json");
     EXPECT_EQ(morvik.names(), Arguments{});
+}
+
+TEST_F(BerRuns, ResumeACompleteRunWithoutSimulatingAnything)
+{
+    const Arguments run = words("ber --block-size 40 --ebn0 0,1 --max-blocks 500 --output a.csv");
+    EXPECT_EQ(morvik.run(run).status, 0);
+    const std::string results = morvik.read("a.csv");  // with the times that it took
+    const CommandResult again = morvik.run(run + words("--resume"));
+    EXPECT_EQ(again.status, 0);
+    EXPECT_EQ(again.err, "");
+    EXPECT_EQ(morvik.read("a.csv"), results);
+    expectRefused(
+        run + words("--resume --seed 2"),
+        "morvik ber: a.csv: holds other results, and there is no checkpoint to resume; remove it to start anew");
+    EXPECT_EQ(morvik.read("a.csv"), results);
+    EXPECT_EQ(morvik.names(), Arguments{"a.csv"});
 }
 
 // ---- Runs in parts
