@@ -120,7 +120,7 @@ stage_tests() {
     ./test
 }
 
-scripts/setup --checks
+scripts/setup --checks --tests
 [ $# -gt 0 ] || set -- format lint compilers abi memory threads fuzz coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then

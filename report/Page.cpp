@@ -1,0 +1,285 @@
+// Page: the report on a run, as one HTML file that needs no other.
+#include "Page.h"
+
+#include <algorithm>
+#include <cmath>
+#include <sstream>
+
+#include "AtomicFile.h"
+#include "PageParts.h"
+#include "Series.h"
+#include "Wording.h"
+
+namespace report {
+
+namespace {
+
+constexpr char noFigure[] = "\u2013";
+
+// ---- Figures as the page shows them
+
+std::string rateText(const Rate& rate)
+{
+    if (rate.below) {
+        return "< " + report::rate(rate.high);
+    }
+    if (!std::isfinite(rate.value)) {
+        return noFigure;
+    }
+    return rate.value == 0 ? "0" : report::rate(rate.value);
+}
+
+std::string intervalText(const Rate& rate)
+{
+    if (rate.below) {
+        return "no error seen";
+    }
+    return rate.hasInterval() ? report::rate(rate.low) + " \u2026 " + report::rate(rate.high) : "";
+}
+
+/// A count, where there were blocks to count in.
+std::string countText(const Sample& sample, std::uint64_t count)
+{
+    return sample.blocks > 0 ? grouped(count) : noFigure;
+}
+
+std::string clippedText(const Sample& sample)
+{
+    return std::isfinite(sample.clipped) ? report::rate(sample.clipped) : noFigure;
+}
+
+std::string rowName(std::size_t curve, std::size_t sample)
+{
+    return "p" + std::to_string(curve) + "-" + std::to_string(sample);
+}
+
+std::string colourName(const std::vector<Curve>& curves, std::size_t curve)
+{
+    const auto colour = std::find_if(colours.begin(), colours.end(), [&](const Colour& other) {
+        return other.onLight == lookOf(curves, curve).colour.onLight;
+    });
+    return colour == colours.end() ? "reference" : "series-" + std::to_string(colour - colours.begin());
+}
+
+// ---- Data for the script
+
+/// A string of JSON that may stand in a script element: nothing in it is taken as markup.
+std::string json(const std::string& text)
+{
+    std::string result = "\"";
+    for (const char c : printable(text)) {
+        if (c == '<') {
+            result += "\\u003c";
+        } else {
+            result += c == '"' || c == '\\' ? std::string("\\") + c : std::string(1, c);
+        }
+    }
+    return result + '"';
+}
+
+std::string json(double value)
+{
+    return std::isfinite(value) ? exact(value) : "null";
+}
+
+std::string json(const Rate& rate)
+{
+    if (!rate.below && !std::isfinite(rate.value)) {
+        return "null";
+    }
+    return "{\"value\":" + json(rate.value) + ",\"low\":" + json(rate.low) + ",\"high\":" + json(rate.high) +
+           ",\"below\":" + (rate.below ? "true" : "false") + ",\"text\":" + json(rateText(rate)) +
+           ",\"interval\":" + json(intervalText(rate)) + '}';
+}
+
+std::string countsJson(const Sample& sample)
+{
+    std::string text;
+    const auto append = [&text](bool known, const std::string& name, const std::string& figure) {
+        if (known) {
+            text += (text.empty() ? "[" : ",[") + json(name) + ',' + json(figure) + ']';
+        }
+    };
+    append(sample.blocks > 0, "Blocks", grouped(sample.blocks));
+    append(sample.blocks > 0, "Bit errors", grouped(sample.bitErrors));
+    append(sample.blocks > 0, "Block errors", grouped(sample.blockErrors));
+    append(std::isfinite(sample.clipped), "Clipped", clippedText(sample));
+    return '[' + text + ']';
+}
+
+std::string dataJson(const std::vector<Curve>& curves)
+{
+    std::string text = "[";
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        const Look look = lookOf(curves, i);
+        text += (i > 0 ? ",\n" : "\n") + std::string("{\"index\":") + std::to_string(i) +
+                ",\"title\":" + json(curves[i].title) + ",\"reference\":" + (curves[i].reference ? "true" : "false") +
+                ",\"colour\":" + json(colourName(curves, i)) + ",\"marker\":" + std::to_string(look.marker) +
+                ",\"dash\":" + std::to_string(look.dash) + ",\"samples\":[";
+        for (std::size_t j = 0; j < curves[i].samples.size(); ++j) {
+            const Sample& sample = curves[i].samples[j];
+            text += (j > 0 ? ",\n" : "\n") + std::string("{\"row\":") + json(rowName(i, j)) +
+                    ",\"ebn0\":" + json(sample.ebn0) + ",\"place\":" + json(decibels(sample.ebn0)) +
+                    ",\"ber\":" + json(bitErrorRate.of(sample)) + ",\"bler\":" + json(blockErrorRate.of(sample)) +
+                    ",\"counts\":" + countsJson(sample) + '}';
+        }
+        text += "]}";
+    }
+    return text + "\n]";
+}
+
+// ---- The page
+
+std::string style()
+{
+    std::ostringstream text;
+    const auto write = [&text](const char* Colour::*side) {
+        for (std::size_t i = 0; i < colours.size(); ++i) {
+            text << " --series-" << i << ": " << colours[i].*side << ';';
+        }
+        text << " --reference: " << referenceColour.*side << ';';
+    };
+    text << ":root {";
+    write(&Colour::onLight);
+    text << " }\n@media screen and (prefers-color-scheme: dark) { :root {";
+    write(&Colour::onDark);
+    text << " } }\n" << pageStyle;
+    return text.str();
+}
+
+/// Nothing may be loaded from anywhere.
+std::string head(const std::string& title)
+{
+    return "<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n<meta charset=\"utf-8\">\n"
+           "<meta http-equiv=\"Content-Security-Policy\" content=\"default-src 'none'; style-src 'unsafe-inline'; "
+           "script-src 'unsafe-inline'; base-uri 'none'; form-action 'none'\">\n"
+           "<meta name=\"viewport\" content=\"width=device-width, initial-scale=1\">\n<title>" +
+           escaped(title) + "</title>\n<style>\n" + style() + "</style>\n</head>\n";
+}
+
+/// "3 curves and 2 references, 40 points".
+std::string lead(const std::vector<Curve>& curves)
+{
+    const auto counted = [](std::size_t count, const std::string& noun) {
+        return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
+    };
+    std::size_t references = 0;
+    std::size_t points = 0;
+    for (const Curve& curve : curves) {
+        references += curve.reference ? 1 : 0;
+        points += curve.samples.size();
+    }
+    return counted(curves.size() - references, "curve") +
+           (references > 0 ? " and " + counted(references, "reference") : "") + ", " + counted(points, "point");
+}
+
+constexpr char figure[] = R"(<section id="figure" aria-labelledby="figure-title">
+<h2 id="figure-title" class="unseen">Curves</h2>
+<div class="controls">
+<fieldset><legend>Show</legend>
+<label class="choice"><input type="radio" name="quantity" value="ber" autocomplete="off" checked><span>BER</span></label>
+<label class="choice"><input type="radio" name="quantity" value="bler" autocomplete="off"><span>BLER</span></label>
+</fieldset>
+<label class="check"><input type="checkbox" id="bars" autocomplete="off" checked>95 % confidence</label>
+<p class="hint">Point at the curves, or use the arrow keys</p>
+</div>
+<div id="chart" tabindex="0" role="group" aria-label="Chart; the arrow keys go from point to point">
+<div id="tip" role="status" hidden></div>
+</div>
+<noscript><p>The curves are drawn by a script, which is not allowed to run here. The table has all the figures.</p></noscript>
+<ul id="legend" aria-label="Series; press to hide or show"></ul>
+</section>
+)";
+
+bool hasClipped(const std::vector<Curve>& curves)
+{
+    return std::any_of(curves.begin(), curves.end(), [](const Curve& curve) {
+        return std::any_of(curve.samples.begin(), curve.samples.end(), [](const Sample& sample) {
+            return std::isfinite(sample.clipped);
+        });
+    });
+}
+
+void writeRow(std::ostream& page, const Sample& sample, const std::string& name, bool withClipped)
+{
+    const auto cell = [&page](const std::string& content) {
+        page << "<td>" << content << "</td>";
+    };
+    page << "<tr id=\"" << name << "\">";
+    cell(decibels(sample.ebn0));
+    for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
+        cell(escaped(rateText(quantity->of(sample))));
+        cell(escaped(intervalText(quantity->of(sample))));
+    }
+    for (const std::uint64_t count : {sample.blocks, sample.bitErrors, sample.blockErrors}) {
+        cell(countText(sample, count));
+    }
+    if (withClipped) {
+        cell(clippedText(sample));
+    }
+    page << "</tr>\n";
+}
+
+void writePoints(std::ostream& page, const std::vector<Curve>& curves)
+{
+    const bool withClipped = hasClipped(curves);
+    page << "<section>\n<h2 id=\"points\">All points</h2>\n<div class=\"scroll\">\n"
+            "<table class=\"points\" aria-labelledby=\"points\">\n<thead><tr><th "
+            "scope=\"col\">E<sub>b</sub>/N<sub>0</sub> "
+            "(dB)</th><th scope=\"col\">BER</th><th scope=\"col\">95 %</th><th scope=\"col\">BLER</th>"
+            "<th scope=\"col\">95 %</th><th scope=\"col\">Blocks</th><th scope=\"col\">Bit errors</th>"
+            "<th scope=\"col\">Block errors</th>"
+         << (withClipped ? "<th scope=\"col\">Clipped</th>" : "") << "</tr></thead>\n";
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        page << "<tbody" << (curves[i].reference ? " class=\"reference\"" : "")
+             << ">\n<tr><th scope=\"rowgroup\" colspan=\"" << (withClipped ? 9 : 8)
+             << "\"><span class=\"swatch\" style=\"border-color: var(--" << colourName(curves, i) << ")\"></span>"
+             << escaped(curves[i].title) << (curves[i].reference ? "<small>reference</small>" : "") << "</th></tr>\n";
+        for (std::size_t j = 0; j < curves[i].samples.size(); ++j) {
+            writeRow(page, curves[i].samples[j], rowName(i, j), withClipped);
+        }
+        page << "</tbody>\n";
+    }
+    page << "</table>\n</div>\n</section>\n";
+}
+
+void writeRun(std::ostream& page, const RunDescription& run)
+{
+    if (!run.parameters.empty()) {
+        page << "<section>\n<h2 id=\"parameters\">Parameters</h2>\n"
+                "<table class=\"parameters\" aria-labelledby=\"parameters\">\n";
+        for (const auto& [name, value] : run.parameters) {
+            page << "<tr><th scope=\"row\">" << escaped(name) << "</th><td>" << escaped(value) << "</td></tr>\n";
+        }
+        page << "</table>\n</section>\n";
+    }
+    if (!run.command.empty()) {
+        page << "<section>\n<h2>Command</h2>\n<pre><code>" << escaped(run.command) << "</code></pre>\n</section>\n";
+    }
+}
+
+}  // namespace
+
+void checkReport(const std::string& fileName)
+{
+    checkWritable(fileName);
+}
+
+void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run)
+{
+    const std::vector<Curve> ordered = inOrder(curves);
+    std::ostringstream page;
+    page << head(run.title) << "<body>\n<main>\n<h1>" << escaped(run.title) << "</h1>\n<p class=\"lead\">"
+         << lead(ordered) << "</p>\n"
+         << figure;
+    writePoints(page, ordered);
+    writeRun(page, run);
+    page << "<footer>Rates are given with their 95 % confidence intervals. Where no error was seen, the rate is below "
+            "the bound that is given; the chart shows it as an open triangle with an arrow.</footer>\n</main>\n"
+            "<script type=\"application/json\" id=\"data\">"
+         << dataJson(ordered) << "</script>\n<script>\n"
+         << pageScript << "</script>\n</body>\n</html>\n";
+    writeAtomically(fileName, page.str());
+}
+
+}  // namespace report

@@ -1,0 +1,29 @@
+// Page: the report on a run, as one HTML file that needs no other.
+#ifndef MORVIK_REPORT_PAGE_H
+#define MORVIK_REPORT_PAGE_H
+
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "Curves.h"
+
+namespace report {
+
+/// What the report says besides the curves. All texts are plain, none is taken as HTML.
+struct RunDescription {
+    std::string title;
+    std::vector<std::pair<std::string, std::string>> parameters;  // name and value
+    std::string command;                                          // the line that repeats the run
+};
+
+/// Throws std::runtime_error, saying why, unless the file can be written.
+void checkReport(const std::string& fileName);
+
+/// Writes the report: the curves to look at closely, a table of all points, the parameters and the command. The file
+/// appears complete or not at all. Throws std::runtime_error.
+void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run);
+
+}  // namespace report
+
+#endif

@@ -1,0 +1,12 @@
+// PageParts: page.css and page.js, as the build found them.
+#ifndef MORVIK_REPORT_PAGEPARTS_H
+#define MORVIK_REPORT_PAGEPARTS_H
+
+namespace report {
+
+extern const char pageStyle[];
+extern const char pageScript[];
+
+}  // namespace report
+
+#endif

@@ -1,0 +1,111 @@
+// Plot: curves drawn to a file by gnuplot.
+#include "Plot.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <stdexcept>
+#include <system_error>
+
+#include "AtomicFile.h"
+#include "ChildProcess.h"
+#include "PlotScript.h"
+#include "Series.h"
+#include "Wording.h"
+
+namespace report {
+
+namespace {
+
+[[noreturn]] void fail(const std::string& fileName, const std::string& what)
+{
+    throw std::runtime_error(fileName + ": " + what);
+}
+
+/// Tells the format; throws where none is known.
+std::string suffixOf(const std::string& fileName)
+{
+    const std::string suffix = std::filesystem::path(fileName).extension().string();
+    if (suffix != ".svg" && suffix != ".png" && suffix != ".pdf") {
+        fail(fileName, "a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
+    }
+    return suffix;
+}
+
+/// What gnuplot says is wrong, on one line: it shows the command above, with a mark below the place.
+std::string lastLine(const std::string& messages)
+{
+    const std::size_t end = messages.find_last_not_of(" \n");
+    if (end == std::string::npos) {
+        return "gnuplot did not end well";
+    }
+    const std::size_t start = messages.find_last_of('\n', end);
+    const std::string line = messages.substr(start + 1, end - start);
+    return "gnuplot says: " + printable(line.substr(std::min(line.find_first_not_of(' '), line.size())));
+}
+
+/// What gnuplot writes to its standard output. It is kept from the user's own settings.
+std::string draw(const std::string& fileName, const std::string& script)
+{
+    try {
+        Outcome outcome = runProgram({"gnuplot", "-d", "-"}, script);
+        if (!outcome.succeeded) {
+            fail(fileName, "cannot be drawn: " + lastLine(outcome.err));
+        }
+        return std::move(outcome.out);
+    } catch (const std::system_error& error) {
+        fail(fileName,
+             "is drawn by gnuplot (Debian's package gnuplot-nox), which cannot be started: " + error.code().message());
+    }
+}
+
+/// What those read who do not see the picture.
+std::string description(const std::vector<Curve>& curves)
+{
+    std::string text = "Bit and block error rates against Eb/N0, on a logarithmic scale. Series: ";
+    const std::vector<Curve> ordered = inOrder(curves);
+    for (std::size_t i = 0; i < ordered.size(); ++i) {
+        text += (i == 0 ? "" : "; ") + ordered[i].title + (ordered[i].reference ? " (reference)" : "");
+    }
+    return text + '.';
+}
+
+/// Puts a title and a description in the place of gnuplot's own.
+std::string labelled(std::string svg, const std::string& title, const std::string& description)
+{
+    const auto replace = [&svg](const std::string& element, const std::string& text) {
+        const std::string open = '<' + element + '>';
+        const std::size_t from = svg.find(open);
+        const std::size_t to = svg.find("</" + element + '>');
+        if (from != std::string::npos && to != std::string::npos) {
+            svg.replace(from + open.size(), to - from - open.size(), escaped(text));
+        }
+    };
+    replace("title", title);
+    replace("desc", description);
+    const std::size_t root = svg.find("<svg");
+    if (root != std::string::npos) {
+        svg.insert(root + 4, " role=\"img\"");
+    }
+    return svg;
+}
+
+}  // namespace
+
+void checkPlot(const std::string& fileName)
+{
+    const std::string suffix = suffixOf(fileName);
+    checkWritable(fileName);
+    draw(fileName, terminalCommand(suffix) + '\n');
+}
+
+void writePlot(const std::string& fileName, const std::vector<Curve>& curves, const std::string& title)
+{
+    const std::string suffix = suffixOf(fileName);
+    std::string picture = draw(fileName, plotScript(suffix, curves, title));
+    if (suffix == ".svg") {
+        picture = labelled(std::move(picture), title, description(curves));
+    }
+    writeAtomically(fileName, picture);
+}
+
+}  // namespace report

@@ -1,0 +1,22 @@
+// Plot: curves drawn to a file by gnuplot.
+#ifndef MORVIK_REPORT_PLOT_H
+#define MORVIK_REPORT_PLOT_H
+
+#include <string>
+#include <vector>
+
+#include "Curves.h"
+
+namespace report {
+
+/// Throws std::runtime_error, saying why, unless writePlot can be expected to work: the file's suffix is .svg, .png or
+/// .pdf, its folder can be written to, and a gnuplot is installed that draws this format.
+void checkPlot(const std::string& fileName);
+
+/// Draws BER and BLER against Eb/N0 in the format of the file's suffix, .svg, .png or .pdf. The file appears complete
+/// or not at all. Throws std::runtime_error.
+void writePlot(const std::string& fileName, const std::vector<Curve>& curves, const std::string& title);
+
+}  // namespace report
+
+#endif

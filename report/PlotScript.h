@@ -1,0 +1,22 @@
+// PlotScript: what gnuplot is told.
+#ifndef MORVIK_REPORT_PLOTSCRIPT_H
+#define MORVIK_REPORT_PLOTSCRIPT_H
+
+#include <string>
+#include <vector>
+
+#include "Curves.h"
+
+namespace report {
+
+/// The command that chooses a format and its size; no size while it is only asked whether gnuplot has the format. The
+/// suffix is .svg, .png or .pdf.
+std::string terminalCommand(const std::string& suffix);
+
+/// The whole script, data included. The picture goes to gnuplot's standard output, so that no file name comes into it;
+/// titles come in as strings that gnuplot does not interpret.
+std::string plotScript(const std::string& suffix, const std::vector<Curve>& curves, const std::string& title);
+
+}  // namespace report
+
+#endif

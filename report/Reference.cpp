@@ -1,0 +1,252 @@
+// Reference: curves to compare with, from CSV files.
+#include "Reference.h"
+
+#include <cerrno>
+#include <charconv>
+#include <cmath>
+#include <filesystem>
+#include <fstream>
+#include <optional>
+#include <stdexcept>
+#include <string_view>
+#include <system_error>
+
+#include "Wording.h"
+
+namespace report {
+
+namespace {
+
+constexpr std::string_view blanks = " \t\r";
+
+std::string_view trimmed(std::string_view text)
+{
+    const std::size_t start = text.find_first_not_of(blanks);
+    return start == std::string_view::npos ? std::string_view()
+                                           : text.substr(start, text.find_last_not_of(blanks) - start + 1);
+}
+
+std::vector<std::string> fieldsOf(std::string_view line)
+{
+    std::vector<std::string> fields;
+    for (std::size_t comma = 0; comma != std::string_view::npos; line.remove_prefix(comma + 1)) {
+        comma = line.find(',');
+        fields.emplace_back(trimmed(line.substr(0, comma)));
+        if (comma == std::string_view::npos) {
+            break;
+        }
+    }
+    return fields;
+}
+
+template <class Number>
+std::optional<Number> parsed(const std::string& text)
+{
+    Number value{};
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value);
+    return result.ec == std::errc() && result.ptr == end ? std::optional<Number>(value) : std::nullopt;
+}
+
+class ReferenceReader {
+public:
+    explicit ReferenceReader(const std::string& fileName) : itsName(fileName), itsFile(fileName, std::ios::binary)
+    {
+        if (!itsFile) {
+            throw std::runtime_error(itsName + ": cannot be opened: " + std::generic_category().message(errno));
+        }
+    }
+
+    std::vector<Curve> read()
+    {
+        for (std::string line; std::getline(itsFile, line);) {
+            ++itsLine;
+            take(trimmed(line));
+        }
+        if (itsFile.bad() || !itsFile.eof()) {
+            throw std::runtime_error(itsName + ": cannot be read: " + std::generic_category().message(errno));
+        }
+        if (itsColumns.empty()) {
+            throw std::runtime_error(itsName + ": has no line that names columns");
+        }
+        if (itsRows.empty()) {
+            throw std::runtime_error(itsName + ": has no row of error rates");
+        }
+        return titled(curvesOf(itsRows));
+    }
+
+private:
+    [[noreturn]] void fail(const std::string& what) const
+    {
+        throw std::runtime_error(itsName + ':' + std::to_string(itsLine) + ": " + what);
+    }
+
+    void take(std::string_view line)
+    {
+        constexpr std::string_view titleMark = "title:";
+        if (line.empty()) {
+            return;
+        }
+        if (line[0] == '#') {
+            const std::string_view comment = trimmed(line.substr(1));
+            if (comment.substr(0, titleMark.size()) == titleMark) {
+                itsTitle = trimmed(comment.substr(titleMark.size()));
+            }
+        } else if (itsColumns.empty()) {
+            takeColumns(fieldsOf(line));
+        } else {
+            takeRow(fieldsOf(line));
+        }
+    }
+
+    void takeColumns(const std::vector<std::string>& names)
+    {
+        itsColumns = names;
+        for (std::size_t i = 0; i < names.size(); ++i) {
+            if (!names[i].empty() && indexOf(names[i]) != i) {
+                fail("column " + shown(names[i]) + " is there twice");
+            }
+        }
+        nameAlike("fer", "bler");
+        nameAlike("frames", "blocks");
+        nameAlike("frame_errors", "block_errors");
+        if (!indexOf("ebn0_db") || (!indexOf("ber") && !indexOf("bler"))) {
+            fail("this line must name the columns, ebn0_db and one of ber, bler and fer among them");
+        }
+    }
+
+    /// Calls a column by the name that is used here, unless another has it.
+    void nameAlike(const std::string& other, const std::string& name)
+    {
+        const auto index = indexOf(other);
+        if (index && !indexOf(name)) {
+            itsColumns[*index] = name;
+        }
+    }
+
+    void takeRow(const std::vector<std::string>& fields)
+    {
+        if (fields.size() != itsColumns.size()) {
+            fail("row of " + std::to_string(fields.size()) + " fields, there are " + std::to_string(itsColumns.size()) +
+                 " columns");
+        }
+        itsFields = fields;
+        Row row;
+        row.setting = setting();
+        row.sample = sample();
+        itsRows.push_back(row);
+    }
+
+    Setting setting() const
+    {
+        Setting setting;
+        setting.blockSize = static_cast<unsigned>(count("block_size", UINT32_MAX));
+        setting.numPu = static_cast<unsigned>(count("num_pu", UINT32_MAX));
+        setting.algorithm = text("algorithm");
+        setting.iterations = static_cast<unsigned>(count("iterations", UINT32_MAX));
+        setting.scale = text("scale_option");
+        return setting;
+    }
+
+    Sample sample() const
+    {
+        Sample sample;
+        sample.ebn0 = number("ebn0_db", -1000, 1000);
+        if (std::isnan(sample.ebn0)) {
+            fail("row without a value in the column ebn0_db");
+        }
+        sample.ber = number("ber", 0, 1);
+        sample.berLow = number("ber_low", 0, 1);
+        sample.berHigh = number("ber_high", 0, 1);
+        sample.bler = number("bler", 0, 1);
+        sample.blerLow = number("bler_low", 0, 1);
+        sample.blerHigh = number("bler_high", 0, 1);
+        sample.clipped = number("clipped_fraction", 0, 1);
+        sample.blocks = count("blocks", UINT64_MAX);
+        sample.bitErrors = count("bit_errors", UINT64_MAX);
+        sample.blockErrors = count("block_errors", UINT64_MAX);
+        sample.berBelow = sample.ber == 0 && sample.berHigh > 0;
+        sample.blerBelow = sample.bler == 0 && sample.blerHigh > 0;
+        return sample;
+    }
+
+    std::optional<std::size_t> indexOf(const std::string& column) const
+    {
+        for (std::size_t i = 0; i < itsColumns.size(); ++i) {
+            if (itsColumns[i] == column) {
+                return i;
+            }
+        }
+        return std::nullopt;
+    }
+
+    /// What the row has in a column; empty where there is no such column.
+    std::string text(const std::string& column) const
+    {
+        const auto index = indexOf(column);
+        return index ? itsFields[*index] : std::string();
+    }
+
+    double number(const std::string& column, double min, double max) const
+    {
+        const std::string field = text(column);
+        if (field.empty()) {
+            return unknown;
+        }
+        const auto value = parsed<double>(field);
+        if (!value || !(*value >= min && *value <= max)) {
+            fail(shown(field) + " in the column " + column + " is not allowed, allowed are numbers from " + exact(min) +
+                 " to " + exact(max));
+        }
+        return *value;
+    }
+
+    std::uint64_t count(const std::string& column, std::uint64_t max) const
+    {
+        const std::string field = text(column);
+        if (field.empty()) {
+            return 0;
+        }
+        const auto value = parsed<std::uint64_t>(field);
+        if (!value || *value > max) {
+            fail(shown(field) + " in the column " + column + " is not allowed, allowed are the integers 0 to " +
+                 std::to_string(max));
+        }
+        return *value;
+    }
+
+    /// A field as messages show it.
+    static std::string shown(const std::string& field)
+    {
+        return '"' + shortened(printable(field), 40) + '"';
+    }
+
+    /// The curves as references, named after the file, too.
+    std::vector<Curve> titled(std::vector<Curve> curves) const
+    {
+        const std::string name =
+            itsTitle.empty() ? std::filesystem::path(itsName).stem().string() : std::string(itsTitle);
+        for (Curve& curve : curves) {
+            curve.title = curve.title.empty() ? name : name + ": " + curve.title;
+            curve.reference = true;
+        }
+        return curves;
+    }
+
+    std::string itsName;
+    std::ifstream itsFile;
+    std::size_t itsLine = 0;
+    std::string itsTitle;
+    std::vector<std::string> itsColumns;
+    std::vector<std::string> itsFields;  // of the current row
+    std::vector<Row> itsRows;
+};
+
+}  // namespace
+
+std::vector<Curve> readReference(const std::string& fileName)
+{
+    return ReferenceReader(fileName).read();
+}
+
+}  // namespace report

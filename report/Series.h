@@ -1,0 +1,63 @@
+// Series: what of the curves can be drawn, and how series look: the same in plots and on pages.
+#ifndef MORVIK_REPORT_SERIES_H
+#define MORVIK_REPORT_SERIES_H
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+#include "Curves.h"
+
+namespace report {
+
+/// One of the two rates of a sample.
+struct Rate {
+    double value;
+    double low;
+    double high;
+    bool below;
+
+    /// There is a place for it on a logarithmic axis: of a rate that is not zero, or of a bound that it is below.
+    bool canBeDrawn() const;
+
+    /// The interval is known.
+    bool hasInterval() const;
+};
+
+/// A quantity that curves show.
+struct Quantity {
+    const char* name;   // "BER"
+    const char* title;  // "Bit error rate"
+    Rate (*of)(const Sample& sample);
+};
+
+extern const Quantity bitErrorRate;
+extern const Quantity blockErrorRate;
+
+/// Colours that tell series apart on white paper and on dark screens, for colour-blind eyes, too: those of M. Okabe and
+/// K. Ito, without the yellow, which white swallows; with the markers, whose number is not a multiple of theirs, they
+/// make 35 series different. References are grey.
+struct Colour {
+    const char* onLight;
+    const char* onDark;
+};
+extern const std::vector<Colour> colours;
+extern const Colour referenceColour;
+
+/// The number of markers: circle, square, triangle, diamond, pentagon. References have them open.
+constexpr std::size_t markers = 5;
+
+/// How a curve is drawn.
+struct Look {
+    Colour colour;
+    std::size_t marker;
+    std::size_t dash;  // 0 is solid
+};
+Look lookOf(const std::vector<Curve>& curves, std::size_t curve);
+
+/// The curves with the references behind the others.
+std::vector<Curve> inOrder(const std::vector<Curve>& curves);
+
+}  // namespace report
+
+#endif

@@ -1,0 +1,150 @@
+// Wording: texts and figures as plots and pages show them, whatever the locale.
+#include "Wording.h"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <cmath>
+
+namespace report {
+
+namespace {
+
+bool isContinuation(char c)
+{
+    return (static_cast<unsigned char>(c) & 0xc0U) == 0x80U;
+}
+
+/// The length of the character that the text begins with; 0 where there is none.
+std::size_t lengthOfFirst(std::string_view text)
+{
+    const auto byteAt = [text](std::size_t i) {
+        return static_cast<unsigned char>(text[i]);
+    };
+    const unsigned first = byteAt(0);
+    if (first < 0x80) {
+        return 1;
+    }
+    const std::size_t length = first >= 0xf0 ? 4 : first >= 0xe0 ? 3 : 2;
+    if (first < 0xc2 || first > 0xf4 || text.size() < length) {
+        return 0;
+    }
+    for (std::size_t i = 1; i < length; ++i) {
+        if (!isContinuation(text[i])) {
+            return 0;
+        }
+    }
+    // Forms longer than need be, surrogates, what is beyond the last character, and two that XML does not have.
+    const unsigned second = byteAt(1);
+    const bool isNone = (first == 0xe0 && second < 0xa0) || (first == 0xed && second >= 0xa0) ||
+                        (first == 0xf0 && second < 0x90) || (first == 0xf4 && second >= 0x90) ||
+                        (first == 0xef && second == 0xbf && byteAt(2) >= 0xbe);
+    return isNone ? 0 : length;
+}
+
+std::string converted(double value, std::chars_format format, int digits)
+{
+    std::array<char, 400> buffer{};  // the largest double has 309 digits before the point
+    const auto result = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value, format, digits);
+    return {buffer.data(), result.ptr};
+}
+
+}  // namespace
+
+std::string printable(std::string_view text)
+{
+    std::string result;
+    while (!text.empty()) {
+        const std::size_t length = lengthOfFirst(text);
+        const bool isControl = length == 1 && (text[0] < ' ' || text[0] == '\x7f');
+        if (length == 0 || isControl) {
+            result += isControl ? ' ' : '?';
+            text.remove_prefix(1);
+        } else {
+            result += text.substr(0, length);
+            text.remove_prefix(length);
+        }
+    }
+    return result;
+}
+
+std::string escaped(std::string_view text)
+{
+    std::string result;
+    for (const char c : printable(text)) {
+        switch (c) {
+        case '&':
+            result += "&amp;";
+            break;
+        case '<':
+            result += "&lt;";
+            break;
+        case '>':
+            result += "&gt;";
+            break;
+        case '"':
+            result += "&quot;";
+            break;
+        case '\'':
+            result += "&#39;";
+            break;
+        default:
+            result += c;
+        }
+    }
+    return result;
+}
+
+std::string shortened(const std::string& text, std::size_t most)
+{
+    if (characters(text) <= most) {
+        return text;
+    }
+    std::size_t end = 0;
+    for (std::size_t kept = 0; kept + 1 < most; ++kept) {
+        ++end;
+        while (isContinuation(text[end])) {
+            ++end;
+        }
+    }
+    return text.substr(0, end) + "\u2026";
+}
+
+std::size_t characters(std::string_view text)
+{
+    return text.size() - static_cast<std::size_t>(std::count_if(text.begin(), text.end(), isContinuation));
+}
+
+std::string decibels(double value)
+{
+    const bool needsThree = std::lround(value * 1000) % 10 != 0;
+    std::string text = converted(value, std::chars_format::fixed, needsThree ? 3 : 2);
+    return text == "-0.00" ? "0.00" : text;
+}
+
+std::string rate(double value)
+{
+    return converted(value, std::chars_format::scientific, 2);
+}
+
+std::string grouped(std::uint64_t count)
+{
+    const std::string digits = std::to_string(count);
+    std::string result;
+    for (std::size_t i = 0; i < digits.size(); ++i) {
+        if (i > 0 && (digits.size() - i) % 3 == 0) {
+            result += "\u202f";
+        }
+        result += digits[i];
+    }
+    return result;
+}
+
+std::string exact(double value)
+{
+    std::array<char, 40> buffer{};
+    const auto result = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value);
+    return {buffer.data(), result.ptr};
+}
+
+}  // namespace report
