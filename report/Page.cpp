@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <locale>
 #include <sstream>
 
 #include "AtomicFile.h"
@@ -133,6 +134,7 @@ std::string dataJson(const std::vector<Curve>& curves)
 std::string style()
 {
     std::ostringstream text;
+    text.imbue(std::locale::classic());
     const auto write = [&text](const char* Colour::*side) {
         for (std::size_t i = 0; i < colours.size(); ++i) {
             text << " --series-" << i << ": " << colours[i].*side << ';';
@@ -234,13 +236,23 @@ void writePoints(std::ostream& page, const std::vector<Curve>& curves)
         page << "<tbody" << (curves[i].reference ? " class=\"reference\"" : "")
              << ">\n<tr><th scope=\"rowgroup\" colspan=\"" << (withClipped ? 9 : 8)
              << "\"><span class=\"swatch\" style=\"border-color: var(--" << colourName(curves, i) << ")\"></span>"
-             << escaped(curves[i].title) << (curves[i].reference ? "<small>reference</small>" : "") << "</th></tr>\n";
+             << escaped(curves[i].title) << (curves[i].reference ? " <small>reference</small>" : "") << "</th></tr>\n";
         for (std::size_t j = 0; j < curves[i].samples.size(); ++j) {
             writeRow(page, curves[i].samples[j], rowName(i, j), withClipped);
         }
         page << "</tbody>\n";
     }
     page << "</table>\n</div>\n</section>\n";
+}
+
+/// A command that may be broken between its words, and not at a hyphen.
+std::string withWholeWords(const std::string& command)
+{
+    std::string result = "<span>";
+    for (const char c : escaped(command)) {
+        result += c == ' ' ? "</span> <span>" : std::string(1, c);
+    }
+    return result + "</span>";
 }
 
 void writeRun(std::ostream& page, const RunDescription& run)
@@ -254,7 +266,8 @@ void writeRun(std::ostream& page, const RunDescription& run)
         page << "</table>\n</section>\n";
     }
     if (!run.command.empty()) {
-        page << "<section>\n<h2>Command</h2>\n<pre><code>" << escaped(run.command) << "</code></pre>\n</section>\n";
+        page << "<section>\n<h2>Command</h2>\n<pre><code>" << withWholeWords(run.command)
+             << "</code></pre>\n</section>\n";
     }
 }
 
@@ -269,6 +282,7 @@ void writeReport(const std::string& fileName, const std::vector<Curve>& curves, 
 {
     const std::vector<Curve> ordered = inOrder(curves);
     std::ostringstream page;
+    page.imbue(std::locale::classic());
     page << head(run.title) << "<body>\n<main>\n<h1>" << escaped(run.title) << "</h1>\n<p class=\"lead\">"
          << lead(ordered) << "</p>\n"
          << figure;

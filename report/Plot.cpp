@@ -69,19 +69,28 @@ std::string description(const std::vector<Curve>& curves)
     return text + '.';
 }
 
-/// Puts a title and a description in the place of gnuplot's own.
+/// Puts a title and a description in the place of gnuplot's own, and takes away those of the parts, which a browser
+/// would show to whoever points at them.
 std::string labelled(std::string svg, const std::string& title, const std::string& description)
 {
-    const auto replace = [&svg](const std::string& element, const std::string& text) {
-        const std::string open = '<' + element + '>';
-        const std::size_t from = svg.find(open);
-        const std::size_t to = svg.find("</" + element + '>');
-        if (from != std::string::npos && to != std::string::npos) {
-            svg.replace(from + open.size(), to - from - open.size(), escaped(text));
+    std::size_t end = 0;
+    const auto replaceNext = [&svg, &end](const std::string& element, const std::string& text) {
+        const std::size_t start = svg.find('<' + element + '>', end);
+        const std::string close = "</" + element + '>';
+        end = start == std::string::npos ? start : svg.find(close, start);
+        if (end == std::string::npos) {
+            return false;
         }
+        svg.replace(start, end + close.size() - start, text);
+        end = start + text.size();
+        return true;
     };
-    replace("title", title);
-    replace("desc", description);
+    const std::string titleElement = "<title>" + escaped(title) + "</title>";
+    const std::string descriptionElement = "<desc>" + escaped(description) + "</desc>";
+    if (replaceNext("title", titleElement) && replaceNext("desc", descriptionElement)) {
+        while (replaceNext("title", "")) {
+        }
+    }
     const std::size_t root = svg.find("<svg");
     if (root != std::string::npos) {
         svg.insert(root + 4, " role=\"img\"");

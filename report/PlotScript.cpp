@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <locale>
 #include <sstream>
 
 #include "Series.h"
@@ -31,14 +32,23 @@ constexpr double arrowLength = 0.4;  // a bound's arrow goes down to this fracti
 constexpr char ink[] = "#222222";
 constexpr char faintInk[] = "#666666";
 
-/// A string that gnuplot takes as it stands.
+/// A string that gnuplot takes as it stands: only the plainest characters are written as themselves.
 std::string quoted(const std::string& text)
 {
-    std::string result = "'";
+    std::string result = "\"";
     for (const char c : printable(text)) {
-        result += c == '\'' ? "''" : std::string(1, c);
+        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == ' ';
+        if (isPlain) {
+            result += c;
+        } else {
+            const unsigned code = static_cast<unsigned char>(c);
+            result += '\\';
+            for (const unsigned digit : {code >> 6U, code >> 3U & 7U, code & 7U}) {
+                result += std::to_string(digit);
+            }
+        }
     }
-    return result + '\'';
+    return result + '"';
 }
 
 std::string dashType(std::size_t dash)
@@ -63,6 +73,7 @@ public:
     Script(const std::vector<Curve>& curves, const std::string& title, const Measures& measures)
         : itsCurves(inOrder(curves)), itsTitle(shortened(printable(title), longestTitle)), itsMeasures(measures)
     {
+        itsText.imbue(std::locale::classic());
         for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
             if (isDrawn(*quantity)) {
                 itsQuantities.push_back(quantity);

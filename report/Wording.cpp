@@ -118,8 +118,8 @@ std::size_t characters(std::string_view text)
 std::string decibels(double value)
 {
     const bool needsThree = std::lround(value * 1000) % 10 != 0;
-    std::string text = converted(value, std::chars_format::fixed, needsThree ? 3 : 2);
-    return text == "-0.00" ? "0.00" : text;
+    const std::string digits = converted(std::abs(value), std::chars_format::fixed, needsThree ? 3 : 2);
+    return std::lround(value * 1000) < 0 ? "\u2212" + digits : digits;
 }
 
 std::string rate(double value)

@@ -189,7 +189,9 @@
         }
         content.append(element("g", {id: "pointer"}));
         const svg = element(
-            "svg", {viewBox: `0 0 ${width} ${height}`, role: "img", "aria-labelledby": "chart-title chart-description"},
+            "svg", {
+                viewBox: `0 0 ${width} ${height}`, role: "img", "aria-labelledby": "chart-title",
+                "aria-describedby": "chart-description"},
             element("title", {id: "chart-title"}, names[quantity]),
             element("desc", {id: "chart-description"}, describe()),
             element("rect", {width, height, fill: "none"}), content);

@@ -1,0 +1,79 @@
+// Curves: which rows make up a curve, and what it is called.
+#include "report/Curves.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace report;
+
+Row row(const Setting& setting, double ebn0)
+{
+    Row result;
+    result.setting = setting;
+    result.sample.ebn0 = ebn0;
+    return result;
+}
+
+std::vector<std::string> titles(const std::vector<Curve>& curves)
+{
+    std::vector<std::string> result;
+    for (const Curve& curve : curves) {
+        result.push_back(curve.title);
+    }
+    return result;
+}
+
+TEST(Curves, RowsOfOneSettingMakeACurve)
+{
+    const Setting small{40, 2, "max-log", 6, "auto"};
+    const Setting large{6144, 8, "scaled", 1, ""};
+    const auto curves =
+        curvesOf({row(small, 1.0), row(large, 0.5), row(small, 0.5), row(large, 0.25), row(small, 2.0)});
+    EXPECT_EQ(
+        titles(curves),
+        (std::vector<std::string>{"K = 40, 2 units, max-log, 6 iterations", "K = 6144, 8 units, scaled, 1 iteration"}));
+    ASSERT_EQ(curves[0].samples.size(), 3U);
+    EXPECT_EQ(curves[0].samples[0].ebn0, 0.5);
+    EXPECT_EQ(curves[0].samples[1].ebn0, 1.0);
+    EXPECT_EQ(curves[0].samples[2].ebn0, 2.0);
+    ASSERT_EQ(curves[1].samples.size(), 2U);
+    EXPECT_FALSE(curves[1].reference);
+}
+
+TEST(Curves, EveryPartOfTheSettingTellsCurvesApart)
+{
+    const Setting setting{512, 4, "table", 8, "8"};
+    std::vector<Row> rows = {
+        row(setting, 0), row(setting, 0), row(setting, 0), row(setting, 0), row(setting, 0), row(setting, 0)};
+    rows[1].setting.blockSize = 40;
+    rows[2].setting.numPu = 8;
+    rows[3].setting.algorithm = "scaled";
+    rows[4].setting.iterations = 6;
+    rows[5].setting.scale = "12";
+    EXPECT_EQ(titles(curvesOf(rows)),
+              (std::vector<std::string>{"K = 512, 4 units, table, 8 iterations, scale 8",
+                                        "K = 40, 4 units, table, 8 iterations, scale 8",
+                                        "K = 512, 8 units, table, 8 iterations, scale 8",
+                                        "K = 512, 4 units, scaled, 8 iterations, scale 8",
+                                        "K = 512, 4 units, table, 6 iterations, scale 8",
+                                        "K = 512, 4 units, table, 8 iterations, scale 12"}));
+}
+
+TEST(Curves, AlgorithmsMayBeNumbers)
+{
+    std::vector<Row> rows;
+    for (const char* const algorithm : {"0", "1", "2", "3"}) {
+        rows.push_back(row({0, 0, algorithm, 0, ""}, 0));
+    }
+    EXPECT_EQ(titles(curvesOf(rows)), (std::vector<std::string>{"max-log", "scaled", "table", "3"}));
+}
+
+TEST(Curves, WhatIsNotKnownIsNotNamed)
+{
+    EXPECT_EQ(titles(curvesOf({row({}, 0)})), std::vector<std::string>{""});
+    EXPECT_EQ(titles(curvesOf({row({512, 0, "", 0, ""}, 0)})), std::vector<std::string>{"K = 512"});
+    EXPECT_TRUE(curvesOf({}).empty());
+}
+
+}  // namespace

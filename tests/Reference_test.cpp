@@ -1,0 +1,209 @@
+// Reference: which files of error rates are read, how, and in what words others are refused.
+#include "report/Reference.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <filesystem>
+
+#include "support/CommaLocale.h"
+#include "support/CommandRunner.h"
+
+namespace {
+
+using namespace report;
+
+class Reference : public testing::Test {
+protected:
+    std::vector<Curve> read(const std::string& text) const
+    {
+        itsFiles.write("rates.csv", text);
+        return readReference(path());
+    }
+
+    /// Expects a refusal in these words, after the file's name.
+    void expectRefused(const std::string& text, const std::string& words) const
+    {
+        try {
+            read(text);
+            ADD_FAILURE() << "was not refused: " << text;
+        } catch (const std::runtime_error& error) {
+            EXPECT_EQ(error.what(), path() + words);
+        }
+    }
+
+    std::string path(const std::string& name = "rates.csv") const
+    {
+        return itsFiles.directory() + '/' + name;
+    }
+
+    const support::CommandRunner itsFiles{"none"};
+};
+
+Curve readOnly(const std::string& name)
+{
+    const auto curves = readReference(MORVIK_ERROR_RATES "/" + name + ".csv");
+    EXPECT_EQ(curves.size(), 1U);
+    return curves.at(0);
+}
+
+TEST_F(Reference, ReadsPublishedErrorRates)
+{
+    const Curve curve = readOnly("aff3ct_lte_k6144_i6_float32");
+    EXPECT_EQ(curve.title, "Turbo (18444,6144) BCJR 32-bit 6 ite. LTE");
+    EXPECT_TRUE(curve.reference);
+    ASSERT_EQ(curve.samples.size(), 11U);
+    const Sample& last = curve.samples.back();
+    EXPECT_EQ(last.ebn0, 1.0);
+    EXPECT_EQ(last.ber, 1.30e-8);
+    EXPECT_EQ(last.bler, 3.26e-5);
+    EXPECT_EQ(last.blocks, 15333312U);
+    EXPECT_EQ(last.bitErrors, 1228U);
+    EXPECT_EQ(last.blockErrors, 500U);
+    EXPECT_TRUE(std::isnan(last.berLow) && std::isnan(last.berHigh) && std::isnan(last.blerLow) &&
+                std::isnan(last.blerHigh));
+    EXPECT_TRUE(std::isnan(last.clipped));
+    EXPECT_FALSE(last.berBelow || last.blerBelow);
+}
+
+TEST_F(Reference, EveryFileOfErrorRatesHasATitle)
+{
+    int files = 0;
+    for (const auto& entry : std::filesystem::directory_iterator(MORVIK_ERROR_RATES)) {
+        if (entry.path().extension() == ".csv") {
+            const std::string name = entry.path().stem().string();
+            const Curve curve = readOnly(name);
+            EXPECT_NE(curve.title, name);
+            EXPECT_GE(curve.samples.size(), 9U);
+            ++files;
+        }
+    }
+    EXPECT_EQ(files, 6);
+}
+
+TEST_F(Reference, ReadsResultsOfARun)
+{
+    const auto curves = read(
+        "point,block_size,num_pu,algorithm,scale_option,iterations,ebn0_db,scale,frames,blocks,bit_errors,block_errors,"
+        "ber,ber_low,ber_high,bler,bler_low,bler_high,clipped_fraction,failed_frames,seconds\n"
+        "0,512,8,scaled,auto,6,1,8.5,0-999,1000,600,20,1.2e-3,1.0e-3,1.4e-3,2.0e-2,1.2e-2,3.1e-2,4.5e-4,3 17,0.1\n"
+        "1,512,8,scaled,auto,6,2,9.5,0-999,1000,0,0,0,0,5.9e-6,0,0,3.0e-3,9e-4,,0.1\n"
+        "2,512,4,table,8,6,1,8,0-999,1000,500,10,1.0e-3,0,0.1,1e-2,0,0.1,4e-4,5,0.1\n");
+    ASSERT_EQ(curves.size(), 2U);
+    EXPECT_EQ(curves[0].title, "rates: K = 512, 8 units, scaled, 6 iterations");
+    EXPECT_EQ(curves[1].title, "rates: K = 512, 4 units, table, 6 iterations, scale 8");
+    EXPECT_TRUE(curves[0].reference && curves[1].reference);
+    ASSERT_EQ(curves[0].samples.size(), 2U);
+    const Sample& first = curves[0].samples[0];
+    EXPECT_EQ(first.blocks, 1000U);
+    EXPECT_EQ(first.berLow, 1.0e-3);
+    EXPECT_EQ(first.berHigh, 1.4e-3);
+    EXPECT_EQ(first.blerLow, 1.2e-2);
+    EXPECT_EQ(first.blerHigh, 3.1e-2);
+    EXPECT_EQ(first.clipped, 4.5e-4);
+    EXPECT_FALSE(first.berBelow || first.blerBelow);
+    const Sample& withoutErrors = curves[0].samples[1];
+    EXPECT_TRUE(withoutErrors.berBelow && withoutErrors.blerBelow);
+    EXPECT_EQ(withoutErrors.berHigh, 5.9e-6);
+    EXPECT_EQ(withoutErrors.blerHigh, 3.0e-3);
+}
+
+TEST_F(Reference, ColumnsMayComeInAnyOrderAndOneRateIsEnough)
+{
+    const auto curves = read("fer , ebn0_db\n 1e-1, 0.5 \n");
+    ASSERT_EQ(curves.size(), 1U);
+    EXPECT_EQ(curves[0].title, "rates");
+    EXPECT_EQ(curves[0].samples.at(0).ebn0, 0.5);
+    EXPECT_EQ(curves[0].samples.at(0).bler, 0.1);
+    EXPECT_TRUE(std::isnan(curves[0].samples.at(0).ber));
+    EXPECT_EQ(curves[0].samples.at(0).blocks, 0U);
+    EXPECT_EQ(read("ebn0_db,ber\n0,1e-5").at(0).samples.at(0).ber, 1e-5);
+}
+
+TEST_F(Reference, ZeroWithoutABoundIsNoBound)
+{
+    const Sample sample = read("ebn0_db,ber,fer\n0.8,0.0000e+00,0\n").at(0).samples.at(0);
+    EXPECT_EQ(sample.ber, 0);
+    EXPECT_FALSE(sample.berBelow || sample.blerBelow);
+}
+
+TEST_F(Reference, AcceptsCarriageReturnsBlankLinesCommentsAndEmptyFields)
+{
+    const auto curves = read("# note\r\n#title:  Mine \r\n\r\nebn0_db,ber,bler\r\n1,,0.5\r\n# note\r\n2,0.1,\r\n\r\n");
+    ASSERT_EQ(curves.size(), 1U);
+    EXPECT_EQ(curves[0].title, "Mine");
+    ASSERT_EQ(curves[0].samples.size(), 2U);
+    EXPECT_TRUE(std::isnan(curves[0].samples[0].ber));
+    EXPECT_TRUE(std::isnan(curves[0].samples[1].bler));
+}
+
+TEST_F(Reference, LocalesHaveNoSay)
+{
+    const CommaLocale locale;
+    EXPECT_EQ(read("ebn0_db,ber,block_size\n1.5,1.5e-3,6144\n").at(0).title, "rates: K = 6144");
+    expectRefused("ebn0_db,ber\n0,2.5\n",
+                  ":2: \"2.5\" in the column ber is not allowed, allowed are numbers from 0 to 1");
+}
+
+TEST_F(Reference, RefusesFilesThatCannotBeRead)
+{
+    for (const auto& [name, reason] : {std::pair("missing.csv", ": cannot be opened: No such file or directory"),
+                                       std::pair("", ": cannot be read: Is a directory")}) {
+        try {
+            readReference(path(name));
+            ADD_FAILURE() << name;
+        } catch (const std::runtime_error& error) {
+            EXPECT_EQ(error.what(), path(name) + reason);
+        }
+    }
+}
+
+TEST_F(Reference, RefusesFilesWithoutRates)
+{
+    expectRefused("", ": has no line that names columns");
+    expectRefused("# title: nothing\n\n", ": has no line that names columns");
+    expectRefused("ebn0_db,ber\n", ": has no row of error rates");
+}
+
+TEST_F(Reference, RefusesOtherColumns)
+{
+    const std::string words = "this line must name the columns, ebn0_db and one of ber, bler and fer among them";
+    expectRefused("0.0,1e-1,1e-2\n", ":1: " + words);
+    expectRefused("# a\nebn0_db,rate\n", ":2: " + words);
+    expectRefused("ber,fer\n", ":1: " + words);
+    expectRefused("ebn0_db,ber,ber\n", ":1: column \"ber\" is there twice");
+}
+
+TEST_F(Reference, RefusesRowsThatDoNotFit)
+{
+    const std::string header = "ebn0_db,ber,frames\n";
+    expectRefused(header + "0,0.5\n", ":2: row of 2 fields, there are 3 columns");
+    expectRefused(header + "0,0.5,1\n1,0.5,1,2\n", ":3: row of 4 fields, there are 3 columns");
+    expectRefused(header + ",0.5,1\n", ":2: row without a value in the column ebn0_db");
+}
+
+TEST_F(Reference, RefusesValuesThatAreNone)
+{
+    const std::string header = "ebn0_db,ber,frames\n";
+    const std::string rates = " in the column ber is not allowed, allowed are numbers from 0 to 1";
+    const std::string counts =
+        " in the column blocks is not allowed, allowed are the integers 0 to 18446744073709551615";
+    const std::string places = " in the column ebn0_db is not allowed, allowed are numbers from -1000 to 1000";
+    expectRefused(header + "0,high,1\n", ":2: \"high\"" + rates);
+    expectRefused(header + "0,1.01,1\n", ":2: \"1.01\"" + rates);
+    expectRefused(header + "0,-0.1,1\n", ":2: \"-0.1\"" + rates);
+    expectRefused(header + "0,nan,1\n", ":2: \"nan\"" + rates);
+    expectRefused(header + "0,0.1x,1\n", ":2: \"0.1x\"" + rates);
+    expectRefused(header + "0,\x1b[31m\xff,1\n", ":2: \" [31m?\"" + rates);
+    expectRefused(header + "0," + std::string(50, '9') + ",1\n", ":2: \"" + std::string(39, '9') + "\u2026\"" + rates);
+    expectRefused(header + "0,0.1,-1\n", ":2: \"-1\"" + counts);
+    expectRefused(header + "0,0.1,1.5\n", ":2: \"1.5\"" + counts);
+    expectRefused(header + "0,0.1,18446744073709551616\n", ":2: \"18446744073709551616\"" + counts);
+    expectRefused(header + "inf,0.1,1\n", ":2: \"inf\"" + places);
+    expectRefused(header + "1e4,0.1,1\n", ":2: \"1e4\"" + places);
+    expectRefused(
+        "ebn0_db,ber,block_size\n0,0.1,4294967296\n",
+        ":2: \"4294967296\" in the column block_size is not allowed, allowed are the integers 0 to 4294967295");
+}
+
+}  // namespace

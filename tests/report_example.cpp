@@ -1,0 +1,52 @@
+// report_example: writes plots and pages of made-up curves into a folder, for tests that look at the files.
+//   report_example FOLDER
+#include <exception>
+#include <iostream>
+#include <string>
+
+#include "report/Page.h"
+#include "report/Plot.h"
+#include "support/SampleCurves.h"
+
+namespace {
+
+void write(const std::string& folder)
+{
+    const std::vector<report::Curve> curves = support::sampleCurves();
+    const std::string title = "Error rates of a made-up decoder";
+    for (const char* const name : {"/plot.svg", "/plot.png", "/plot.pdf"}) {
+        report::writePlot(folder + name, curves, title);
+    }
+    report::writeReport(
+        folder + "/report.html",
+        curves,
+        {title,
+         {{"Block size", "512"}, {"Processing units", "8"}, {"Stop rule", "300 block errors"}, {"Seed", "1"}},
+         "morvik ber --block-size 512 --algorithm scaled,max-log --seed 1"});
+}
+
+void writeHostile(const std::string& folder)
+{
+    const std::vector<report::Curve> curves = support::hostileCurves();
+    report::writePlot(folder + "/hostile.svg", curves, curves[1].title);
+    report::writeReport(
+        folder + "/hostile.html", curves, {curves[1].title, {{curves[1].title, curves[0].title}}, curves[0].title});
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    if (argc != 2) {
+        std::cerr << "report_example: one argument is needed, the folder\n";
+        return 2;
+    }
+    try {
+        write(argv[1]);
+        writeHostile(argv[1]);
+        return 0;
+    } catch (const std::exception& error) {
+        std::cerr << "report_example: " << error.what() << '\n';
+        return 1;
+    }
+}
