@@ -103,6 +103,7 @@ Outcome runProgram(const std::vector<std::string>& commandLine, const std::strin
 {
     std::vector<std::string> words = commandLine;
     std::vector<char*> argv;
+    argv.reserve(words.size() + 1);
     for (std::string& word : words) {
         argv.push_back(word.data());
     }

@@ -24,7 +24,7 @@ namespace {
 /// Tells the format; throws where none is known.
 std::string suffixOf(const std::string& fileName)
 {
-    const std::string suffix = std::filesystem::path(fileName).extension().string();
+    std::string suffix = std::filesystem::path(fileName).extension().string();
     if (suffix != ".svg" && suffix != ".png" && suffix != ".pdf") {
         fail(fileName, "a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
     }

@@ -23,7 +23,9 @@ constexpr int noteHeight = 34;
 constexpr int leftMargin = 62;  // of each panel, where its numbers are
 constexpr int rightMargin = 18;
 
-constexpr std::size_t longestTitle = 110;  // characters, so that the legend stays within the picture
+// In characters, so that they stay within the picture.
+constexpr std::size_t longestTitle = 95;
+constexpr std::size_t longestEntry = 110;  // of the legend
 constexpr int characterWidth = 7;
 constexpr int legendLine = 42;
 constexpr int legendSample = 72;  // what an entry takes besides its title: line and spaces
@@ -129,7 +131,7 @@ private:
 
     static std::string legendTitle(const Curve& curve)
     {
-        return shortened(printable(curve.title), longestTitle);
+        return shortened(printable(curve.title), longestEntry);
     }
 
     /// A place of the picture, counted from its upper left corner, as gnuplot counts: fractions, from below.
@@ -195,6 +197,8 @@ private:
                 bars += exact(sample.ebn0) + ' ' + exact(std::max(rate.low, least)) + ' ' + exact(rate.high) + '\n';
             }
         }
+        itsHasBars = itsHasBars || !bars.empty();
+        itsHasBounds = itsHasBounds || !bounds.empty();
         writeBlock(lineData(quantity, curve), lines);
         writeBlock(barData(quantity, curve), bars);
         writeBlock(boundData(quantity, curve), bounds);
@@ -256,7 +260,6 @@ private:
                 << "set grid xtics ytics mytics ls 1, ls 2\n"
                 << "set border 3 lc rgb '#888888' lw 1\n"
                 << "set tics nomirror out scale 0.6,0.3 textcolor rgb '" << ink << "'\n"
-                << "set bars 0.5\n"
                 << "set label 1 " << quoted(itsTitle) << " at " << at(leftMargin, 24) << " left noenhanced" << font(16)
                 << " textcolor rgb '" << ink << "'\n";
     }
@@ -344,7 +347,7 @@ private:
         const auto count = static_cast<int>(itsCurves.size());
         const int rows = legendRows();
         const int left = (width - itsEntryWidth * ((count + rows - 1) / rows)) / 2;
-        std::string commands;
+        std::ostringstream commands;
         for (int i = 0; i < count; ++i) {
             const auto curve = static_cast<std::size_t>(i);
             const int x = left + itsEntryWidth * (i / rows);
@@ -358,24 +361,18 @@ private:
                     << row(x) << row(x + legendLine / 2) << row(x + legendLine) << "END\n"
                     << "set label " << i + 2 << ' ' << quoted(legendTitle(itsCurves[curve])) << " at "
                     << x + legendLine + 10 << ',' << y << " left noenhanced textcolor rgb '" << ink << "'\n";
-            commands += ", " + block + " with lines" + lineStyle(curve) + " notitle, " + block +
-                        " every ::1::1 with points" + pointStyle(curve) + " notitle";
+            commands << ", " << block << " with lines" << lineStyle(curve) << " notitle, " << block
+                     << " every ::1::1 with points" << pointStyle(curve) << " notitle";
         }
-        itsText << "plot NaN notitle" << commands << '\n';
+        itsText << "plot NaN notitle" << commands.str() << '\n';
     }
 
+    /// Explains what is drawn besides lines and markers.
     std::string note() const
     {
-        const auto hasAny = [this](const std::string& ending) {
-            return std::any_of(itsBlocks.begin(), itsBlocks.end(), [&ending](const std::string& name) {
-                return name.size() > ending.size() && name.substr(name.size() - ending.size()) == ending;
-            });
-        };
-        std::string text = hasAny("_bars") ? "Bars: 95 % confidence." : "";
-        if (hasAny("_bounds")) {
-            text += std::string(text.empty() ? "" : "  ") + "Open triangles: no error was seen, the rate is lower.";
-        }
-        return text;
+        const std::string bars = itsHasBars ? "Bars: 95 % confidence." : "";
+        const std::string bounds = itsHasBounds ? "Open triangles: no error was seen, the rate is lower." : "";
+        return bars + (itsHasBars && itsHasBounds ? "  " : "") + bounds;
     }
 
     std::vector<Curve> itsCurves;
@@ -384,6 +381,8 @@ private:
     int itsEntryWidth = legendSample;  // of the legend
     std::vector<const Quantity*> itsQuantities;
     std::vector<std::string> itsBlocks;
+    bool itsHasBars = false;
+    bool itsHasBounds = false;
     std::ostringstream itsText;
 };
 

@@ -18,6 +18,7 @@ Row row(const Setting& setting, double ebn0)
 std::vector<std::string> titles(const std::vector<Curve>& curves)
 {
     std::vector<std::string> result;
+    result.reserve(curves.size());
     for (const Curve& curve : curves) {
         result.push_back(curve.title);
     }

@@ -83,9 +83,10 @@ std::string refusal(Function function)
     return "not refused";
 }
 
+/// What the check and the drawing say, which is the same.
 std::string sayings(const std::string& path)
 {
-    const std::string check = refusal([&path] { checkPlot(path); });
+    std::string check = refusal([&path] { checkPlot(path); });
     EXPECT_EQ(check, refusal([&path] { writePlot(path, support::sampleCurves(), "Title"); }));
     return check;
 }
