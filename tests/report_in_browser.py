@@ -1,6 +1,6 @@
 """The report in a browser: it loads quietly, draws the curves, shows the figures of the point under the pointer.
 
-    report_in_browser.py REPORT_EXAMPLE [SCREENSHOTS]    with a second folder, leaves pictures there to look at
+    report_in_browser.py REPORT_EXAMPLE [FOLDER]    with a folder, leaves pictures to look at there instead of testing
 """
 
 import base64
@@ -110,6 +110,8 @@ class ReportInBrowser(unittest.TestCase):
         self.assertAlmostEqual((x4 - x0) / (x1 - x0), 4, delta=0.01)  # 0, 0.25 and 1 dB
         decades = self.evaluate("Array.from(document.querySelectorAll('#chart .major'), line => line.getBoundingClientRect())"
                                 ".filter(box => box.height < box.width).map(box => box.y)")
+        self.assertEqual(self.texts("#chart text")[:3], ["100", "10−1", "10−2"], "the rows are decades, from the top")
+        self.assertAlmostEqual((y0 - decades[0]) / (decades[1] - decades[0]), 1.256, delta=0.02)  # 5.55e-02
         # Block error rates of 303 / 320 and 301 / 4224 are 1.1234 decades apart, and bit error rates as well.
         self.assertAlmostEqual((y4 - y0) / (decades[1] - decades[0]), 1.1234, delta=0.02)
 
@@ -246,8 +248,7 @@ class ReportInBrowser(unittest.TestCase):
 
     # ---- To look at
 
-    @unittest.skipIf(SCREENSHOTS is None, "only where a folder for them is given")
-    def test_screenshots(self):
+    def screenshots(self):
         for scheme in ("light", "dark"):
             self.open("report.html", height=2500)
             self.browser.media(scheme=scheme)
@@ -274,4 +275,4 @@ def brightness(colour):
 
 
 if __name__ == "__main__":
-    unittest.main(argv=sys.argv[:1])
+    unittest.main(argv=sys.argv[:1] + (["ReportInBrowser.screenshots"] if SCREENSHOTS else []))

@@ -42,7 +42,11 @@ class Browser:
         self.events = []
         self.messages = []
         self.requests = []
-        self._attach()
+        try:
+            self._attach()
+        except BaseException:
+            self.close()
+            raise
 
     @staticmethod
     def _pipe():
