@@ -7,13 +7,6 @@ namespace report {
 
 namespace {
 
-std::string algorithmName(const std::string& algorithm)
-{
-    const char* const names[] = {"max-log", "scaled", "table"};
-    const bool isType = algorithm.size() == 1 && algorithm[0] >= '0' && algorithm[0] <= '2';
-    return isType ? names[algorithm[0] - '0'] : algorithm;
-}
-
 std::string counted(unsigned count, const std::string& noun)
 {
     return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
@@ -29,7 +22,7 @@ std::string titleOf(const Setting& setting)
     };
     append(setting.blockSize != 0, "K = " + std::to_string(setting.blockSize));
     append(setting.numPu != 0, counted(setting.numPu, "unit"));
-    append(!setting.algorithm.empty(), algorithmName(setting.algorithm));
+    append(!setting.algorithm.empty(), setting.algorithm);
     append(setting.iterations != 0, counted(setting.iterations, "iteration"));
     append(!setting.scale.empty() && setting.scale != "auto", "scale " + setting.scale);
     return title;

@@ -46,7 +46,7 @@ struct Curve {
 struct Setting {
     unsigned blockSize = 0;
     unsigned numPu = 0;
-    std::string algorithm;  // a number, or a name as --algorithm takes it
+    std::string algorithm;  // its name
     unsigned iterations = 0;
     std::string scale;  // steps for amplitude 1; empty or "auto" where it follows from the rest
 };

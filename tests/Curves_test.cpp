@@ -61,15 +61,6 @@ TEST(Curves, EveryPartOfTheSettingTellsCurvesApart)
                                         "K = 512, 4 units, table, 8 iterations, scale 12"}));
 }
 
-TEST(Curves, AlgorithmsMayBeNumbers)
-{
-    std::vector<Row> rows;
-    for (const char* const algorithm : {"0", "1", "2", "3"}) {
-        rows.push_back(row({0, 0, algorithm, 0, ""}, 0));
-    }
-    EXPECT_EQ(titles(curvesOf(rows)), (std::vector<std::string>{"max-log", "scaled", "table", "3"}));
-}
-
 TEST(Curves, WhatIsNotKnownIsNotNamed)
 {
     EXPECT_EQ(titles(curvesOf({row({}, 0)})), std::vector<std::string>{""});
