@@ -56,9 +56,9 @@ std::string rowName(std::size_t curve, std::size_t sample)
 
 std::string colourName(const std::vector<Curve>& curves, std::size_t curve)
 {
-    const auto colour = std::find_if(colours.begin(), colours.end(), [&](const Colour& other) {
-        return other.onLight == lookOf(curves, curve).colour.onLight;
-    });
+    const Look look = lookOf(curves, curve);
+    const auto colour = std::find_if(
+        colours.begin(), colours.end(), [&look](const Colour& other) { return other.onLight == look.colour.onLight; });
     return colour == colours.end() ? "reference" : "series-" + std::to_string(colour - colours.begin());
 }
 
@@ -116,7 +116,8 @@ std::string dataJson(const std::vector<Curve>& curves)
         text += (i > 0 ? ",\n" : "\n") + std::string("{\"index\":") + std::to_string(i) +
                 ",\"title\":" + json(curves[i].title) + ",\"reference\":" + (curves[i].reference ? "true" : "false") +
                 ",\"colour\":" + json(colourName(curves, i)) + ",\"marker\":" + std::to_string(look.marker) +
-                ",\"dash\":" + std::to_string(look.dash) + ",\"samples\":[";
+                ",\"dash\":" + std::to_string(look.dash) + ",\"layer\":" + std::to_string(look.layer) +
+                ",\"samples\":[";
         for (std::size_t j = 0; j < curves[i].samples.size(); ++j) {
             const Sample& sample = curves[i].samples[j];
             text += (j > 0 ? ",\n" : "\n") + std::string("{\"row\":") + json(rowName(i, j)) +

@@ -84,8 +84,9 @@ public:
         if (itsQuantities.empty()) {
             itsQuantities = {&bitErrorRate, &blockErrorRate};
         }
-        for (const Curve& curve : itsCurves) {
-            const auto length = static_cast<int>(characters(legendTitle(curve)));
+        for (std::size_t i = 0; i < itsCurves.size(); ++i) {
+            itsLooks.push_back(lookOf(itsCurves, i));
+            const auto length = static_cast<int>(characters(legendTitle(itsCurves[i])));
             itsEntryWidth = std::max(itsEntryWidth, legendSample + characterWidth * length);
         }
     }
@@ -291,26 +292,24 @@ private:
         itsText << "\nunset label 1\n";  // it is drawn with the first panel
     }
 
-    std::string markerOf(std::size_t curve) const
-    {
-        const int open[markers] = {6, 4, 8, 12, 14};  // the next number is the filled one
-        return std::to_string(open[lookOf(itsCurves, curve).marker] + (itsCurves[curve].reference ? 0 : 1));
-    }
-
     std::string colourOf(std::size_t curve) const
     {
-        return std::string(" lc rgb '") + lookOf(itsCurves, curve).colour.onLight + "'";
+        return std::string(" lc rgb '") + itsLooks[curve].colour.onLight + "'";
     }
 
     std::string lineStyle(std::size_t curve) const
     {
-        return colourOf(curve) + " lw " + (itsCurves[curve].reference ? "1.5" : "2") + " dt " +
-               dashType(lookOf(itsCurves, curve).dash);
+        const double lineWidth =
+            itsCurves[curve].reference ? 1.5 : 2 + 2.0 * static_cast<double>(itsLooks[curve].layer);
+        return colourOf(curve) + " lw " + exact(lineWidth) + " dt " + dashType(itsLooks[curve].dash);
     }
 
     std::string pointStyle(std::size_t curve) const
     {
-        return colourOf(curve) + " lw 1.5 ps " + exact(0.8 * itsMeasures.point) + " pt " + markerOf(curve);
+        const int open[markers] = {6, 4, 8, 12, 14};  // the next number is the filled one
+        const int marker = open[itsLooks[curve].marker] + (itsCurves[curve].reference ? 0 : 1);
+        const double size = itsMeasures.point * (0.8 + 0.35 * static_cast<double>(itsLooks[curve].layer));
+        return colourOf(curve) + " lw 1.5 ps " + exact(size) + " pt " + std::to_string(marker);
     }
 
     void writeCurve(const Quantity& quantity, std::size_t curve)
@@ -376,6 +375,7 @@ private:
     }
 
     std::vector<Curve> itsCurves;
+    std::vector<Look> itsLooks;
     std::string itsTitle;
     Measures itsMeasures;
     int itsEntryWidth = legendSample;  // of the legend

@@ -51,7 +51,8 @@ constexpr std::size_t markers = 5;
 struct Look {
     Colour colour;
     std::size_t marker;
-    std::size_t dash;  // 0 is solid
+    std::size_t dash;   // 0 is solid
+    std::size_t layer;  // how many of the curves drawn later cover it: it is broader, to show on both sides of them
 };
 Look lookOf(const std::vector<Curve>& curves, std::size_t curve);
 

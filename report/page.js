@@ -27,6 +27,9 @@
     const rounded = value => Math.round(value * 100) / 100;
     const colourOf = curve => `var(--${curve.colour})`;
     const drawn = rate => rate !== null && (rate.below ? rate.high : rate.value) > 0;
+    // A curve that others cover is broader, to show on both sides of them.
+    const widthOf = curve => curve.reference ? 1.5 : 2 + 2 * curve.layer;
+    const sizeOf = curve => 3.6 + 1.6 * curve.layer;
     const heightOf = rate => rate.below ? rate.high : rate.value;
 
     function marker(curve, x, y, size) {
@@ -157,11 +160,13 @@
             if (bars.checked && rate.low !== null && rate.high !== null) {
                 group.append(confidenceBar(curve, rate, x, scale));
             }
-            above.push(marker(curve, x, y, 3.6));
+            above.push(marker(curve, x, y, sizeOf(curve)));
         }
         if (path !== "") {
             group.append(element(
-                "path", {class: "curve", stroke: colourOf(curve), "stroke-dasharray": dashes[curve.dash], d: path}));
+                "path", {
+                    class: "curve", stroke: colourOf(curve), "stroke-width": widthOf(curve),
+                    "stroke-dasharray": dashes[curve.dash], d: path}));
         }
         group.append(...above);
         return group;
@@ -319,8 +324,9 @@
         button.append(
             element("svg", {width: 40, height: 16, "aria-hidden": "true"},
                 element("path", {
-                    d: "M2 8H38", stroke: colourOf(curve), "stroke-width": 2, "stroke-dasharray": dashes[curve.dash]}),
-                marker(curve, 20, 8, 3.6)),
+                    d: "M2 8H38", stroke: colourOf(curve), "stroke-width": widthOf(curve),
+                    "stroke-dasharray": dashes[curve.dash]}),
+                marker(curve, 20, 8, sizeOf(curve))),
             curve.title);
         button.addEventListener("click", () => {
             if (!hidden.delete(curve.index)) {

@@ -57,6 +57,13 @@ class PictureFiles(unittest.TestCase):
         self.assertEqual(symbols(9, colours["max-log"]), 2)
         self.assertIn("stroke-dasharray", text)
 
+    def test_svg_shows_covered_curves_on_both_sides(self):
+        path = r"stroke-width=\"([0-9.]+)\"[^>]*>\s*<path stroke='rgb\(  0, 114, 178\)'"
+        widths = lambda name: set(re.findall(path, self.content(name).decode()))
+        bars = {"1.20"}
+        self.assertEqual(widths("plot.svg"), {"2.00"} | bars)
+        self.assertEqual(widths("hostile.svg"), {"4.00"} | bars)
+
     def test_svg_has_markup_in_titles_as_text(self):
         picture = self.svg("hostile.svg")
         texts = ["".join(text.itertext()).strip() for text in picture.iter(SVG + "text")]

@@ -115,6 +115,13 @@ class ReportInBrowser(unittest.TestCase):
         # Block error rates of 303 / 320 and 301 / 4224 are 1.1234 decades apart, and bit error rates as well.
         self.assertAlmostEqual((y4 - y0) / (decades[1] - decades[0]), 1.1234, delta=0.02)
 
+    def test_covered_curves_show_on_both_sides(self):
+        widths = ("Array.from(document.querySelectorAll('#chart .own path.curve'),"
+                  "line => parseFloat(getComputedStyle(line).strokeWidth))")
+        self.assertEqual(self.evaluate(widths), [2, 2])
+        self.open("hostile.html")
+        self.assertEqual(self.evaluate(widths), [4, 2])
+
     def test_references_are_dashed(self):
         dashes = self.evaluate("Array.from(document.querySelectorAll('#chart path.curve'), line => "
                                "[line.parentNode.classList.contains('reference'), getComputedStyle(line).strokeDasharray])")

@@ -76,7 +76,7 @@ std::vector<report::Curve> hostileCurves()
 {
     return {reference("</script><script>console.error('script')</script>"),
             curve("<img src=x onerror=\"console.error('image')\"> & 'quoted' \\\" \x80 \x01", 0),
-            curve("'; system 'touch injected' # `touch injected` $(touch injected) {/:Bold x}_1^2 @HOME %s", 0.15)};
+            curve("'; system 'touch injected' # `touch injected` $(touch injected) {/:Bold x}_1^2 @HOME %s", 0)};
 }
 
 }  // namespace support

@@ -12,7 +12,7 @@ namespace support {
 /// which has no confidence intervals.
 std::vector<report::Curve> sampleCurves();
 
-/// The same with titles that try to be markup, commands and strings' ends.
+/// The same with titles that try to be markup, commands and strings' ends, the last curve covering the one before.
 std::vector<report::Curve> hostileCurves();
 
 }  // namespace support

@@ -1,0 +1,104 @@
+// Series: what can be drawn, and that series can be told apart.
+#include "report/Series.h"
+
+#include <gtest/gtest.h>
+
+#include <set>
+#include <tuple>
+
+#include "support/SampleCurves.h"
+
+namespace {
+
+using namespace report;
+
+const Curve curve = support::sampleCurves().at(1);
+const Curve farCurve = support::sampleCurves().at(2);
+const Curve reference = support::sampleCurves().at(0);
+
+/// The curve with its rates multiplied.
+Curve multiplied(Curve result, double factor)
+{
+    for (Sample& sample : result.samples) {
+        for (double* const rate : {&sample.ber, &sample.berHigh, &sample.bler, &sample.blerHigh}) {
+            *rate *= factor;
+        }
+    }
+    return result;
+}
+
+TEST(Series, OnlyRatesAboveZeroCanBeDrawn)
+{
+    EXPECT_TRUE((Rate{0.1, unknown, unknown, false}.canBeDrawn()));
+    EXPECT_FALSE((Rate{0, 0, 0.1, false}.canBeDrawn()));
+    EXPECT_FALSE((Rate{unknown, unknown, unknown, false}.canBeDrawn()));
+    EXPECT_TRUE((Rate{0, 0, 0.1, true}.canBeDrawn())) << "at the bound";
+    EXPECT_FALSE((Rate{0, 0, unknown, true}.canBeDrawn()));
+    EXPECT_FALSE((Rate{0.1, 0, unknown, false}.hasInterval()));
+    EXPECT_TRUE((Rate{0.1, 0, 0.2, false}.hasInterval()));
+}
+
+TEST(Series, ReferencesAreBehindTheOthers)
+{
+    const auto ordered = inOrder({reference, curve, reference, farCurve});
+    EXPECT_EQ(ordered[0].title, curve.title);
+    EXPECT_EQ(ordered[1].title, farCurve.title);
+    EXPECT_TRUE(ordered[2].reference && ordered[3].reference);
+}
+
+TEST(Series, ThirtyFiveSeriesLookDifferent)
+{
+    const std::vector<Curve> curves(35, Curve{"", false, {}});
+    std::set<std::tuple<std::string, std::size_t>> looks;
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        const Look look = lookOf(curves, i);
+        EXPECT_EQ(look.dash, 0U);
+        EXPECT_LT(look.marker, markers);
+        looks.emplace(look.colour.onLight, look.marker);
+    }
+    EXPECT_EQ(looks.size(), curves.size());
+}
+
+TEST(Series, ReferencesAreGreyAndDashedAndCountOnTheirOwn)
+{
+    const std::vector<Curve> curves = {curve, reference, farCurve, reference};
+    EXPECT_EQ(lookOf(curves, 1).colour.onLight, std::string(referenceColour.onLight));
+    EXPECT_EQ(lookOf(curves, 1).dash, 1U);
+    EXPECT_EQ(lookOf(curves, 3).dash, 2U);
+    EXPECT_EQ(lookOf(curves, 3).marker, 1U);
+    EXPECT_EQ(lookOf(curves, 2).colour.onLight, std::string(colours[1].onLight));
+    EXPECT_EQ(lookOf(curves, 2).marker, 1U);
+}
+
+TEST(Series, CurvesThatOthersCoverLieBelowThem)
+{
+    const std::vector<Curve> curves = {curve, farCurve, curve, multiplied(curve, 1.05), multiplied(curve, 1.2), curve};
+    EXPECT_EQ(lookOf(curves, 0).layer, 3U);
+    EXPECT_EQ(lookOf(curves, 1).layer, 0U) << "it is elsewhere";
+    EXPECT_EQ(lookOf(curves, 2).layer, 2U);
+    EXPECT_EQ(lookOf(curves, 3).layer, 1U) << "the difference does not show";
+    EXPECT_EQ(lookOf(curves, 4).layer, 0U) << "the difference shows";
+    EXPECT_EQ(lookOf(curves, 5).layer, 0U) << "it is on top";
+    EXPECT_EQ(lookOf({curve, reference, reference}, 0).layer, 0U) << "references are drawn first";
+    EXPECT_EQ(lookOf({reference, reference}, 0).layer, 0U);
+}
+
+TEST(Series, AFewOtherPointsDoNotUncoverACurve)
+{
+    Curve above = curve;
+    above.samples[0].ber *= 2;
+    above.samples[1].bler *= 2;
+    above.samples[2].ebn0 += 0.1;
+    above.samples.pop_back();
+    EXPECT_EQ(lookOf({curve, above}, 0).layer, 1U);
+    above.samples.resize(4);
+    EXPECT_EQ(lookOf({curve, above}, 0).layer, 0U);
+}
+
+TEST(Series, AtMostThreeLayersAreShown)
+{
+    EXPECT_EQ(lookOf(std::vector<Curve>(9, curve), 0).layer, 3U);
+    EXPECT_EQ(lookOf(std::vector<Curve>(9, curve), 6).layer, 2U);
+}
+
+}  // namespace
