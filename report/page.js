@@ -278,7 +278,7 @@
         let least = reach;
         for (const place of places) {
             const distance = Math.hypot(place.x - x, place.y - y);
-            if (distance < least) {
+            if (distance <= least) {  // of several in one place, the one on top
                 best = place;
                 least = distance;
             }
