@@ -6,10 +6,10 @@
 #include <locale>
 #include <sstream>
 
-#include "AtomicFile.h"
 #include "PageParts.h"
 #include "Series.h"
 #include "Wording.h"
+#include "simulation/AtomicFile.h"
 
 namespace report {
 
@@ -276,7 +276,7 @@ void writeRun(std::ostream& page, const RunDescription& run)
 
 void checkReport(const std::string& fileName)
 {
-    checkWritable(fileName);
+    simulation::checkWritable(fileName);
 }
 
 void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run)
@@ -294,7 +294,7 @@ void writeReport(const std::string& fileName, const std::vector<Curve>& curves, 
             "<script type=\"application/json\" id=\"data\">"
          << dataJson(ordered) << "</script>\n<script>\n"
          << pageScript << "</script>\n</body>\n</html>\n";
-    writeAtomically(fileName, page.str());
+    simulation::writeAtomically(fileName, page.str());
 }
 
 }  // namespace report

@@ -6,11 +6,11 @@
 #include <stdexcept>
 #include <system_error>
 
-#include "AtomicFile.h"
 #include "ChildProcess.h"
 #include "PlotScript.h"
 #include "Series.h"
 #include "Wording.h"
+#include "simulation/AtomicFile.h"
 
 namespace report {
 
@@ -103,7 +103,7 @@ std::string labelled(std::string svg, const std::string& title, const std::strin
 void checkPlot(const std::string& fileName)
 {
     const std::string suffix = suffixOf(fileName);
-    checkWritable(fileName);
+    simulation::checkWritable(fileName);
     draw(fileName, terminalCommand(suffix) + '\n');
 }
 
@@ -114,7 +114,7 @@ void writePlot(const std::string& fileName, const std::vector<Curve>& curves, co
     if (suffix == ".svg") {
         picture = labelled(std::move(picture), title, description(curves));
     }
-    writeAtomically(fileName, picture);
+    simulation::writeAtomically(fileName, picture);
 }
 
 }  // namespace report

@@ -1,17 +1,17 @@
 // Reference: curves to compare with, from CSV files.
 #include "Reference.h"
 
-#include <cerrno>
 #include <charconv>
 #include <cmath>
 #include <filesystem>
-#include <fstream>
 #include <optional>
+#include <sstream>
 #include <stdexcept>
 #include <string_view>
 #include <system_error>
 
 #include "Wording.h"
+#include "simulation/TextFile.h"
 
 namespace report {
 
@@ -29,13 +29,12 @@ std::string_view trimmed(std::string_view text)
 std::vector<std::string> fieldsOf(std::string_view line)
 {
     std::vector<std::string> fields;
-    for (std::size_t comma = 0; comma != std::string_view::npos; line.remove_prefix(comma + 1)) {
-        comma = line.find(',');
+    std::size_t comma = line.find(',');
+    for (; comma != std::string_view::npos; comma = line.find(',')) {
         fields.emplace_back(trimmed(line.substr(0, comma)));
-        if (comma == std::string_view::npos) {
-            break;
-        }
+        line.remove_prefix(comma + 1);
     }
+    fields.emplace_back(trimmed(line));
     return fields;
 }
 
@@ -50,21 +49,14 @@ std::optional<Number> parsed(const std::string& text)
 
 class ReferenceReader {
 public:
-    explicit ReferenceReader(const std::string& fileName) : itsName(fileName), itsFile(fileName, std::ios::binary)
-    {
-        if (!itsFile) {
-            throw std::runtime_error(itsName + ": cannot be opened: " + std::generic_category().message(errno));
-        }
-    }
+    explicit ReferenceReader(const std::string& fileName) : itsName(fileName) {}
 
     std::vector<Curve> read()
     {
-        for (std::string line; std::getline(itsFile, line);) {
+        std::istringstream lines(simulation::readText(itsName));
+        for (std::string line; std::getline(lines, line);) {
             ++itsLine;
             take(trimmed(line));
-        }
-        if (itsFile.bad() || !itsFile.eof()) {
-            throw std::runtime_error(itsName + ": cannot be read: " + std::generic_category().message(errno));
         }
         if (itsColumns.empty()) {
             throw std::runtime_error(itsName + ": has no line that names columns");
@@ -234,7 +226,6 @@ private:
     }
 
     std::string itsName;
-    std::ifstream itsFile;
     std::size_t itsLine = 0;
     std::string itsTitle;
     std::vector<std::string> itsColumns;

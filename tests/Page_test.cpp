@@ -7,8 +7,8 @@
 #include <regex>
 
 #include "support/CommaLocale.h"
-#include "support/CommandRunner.h"
 #include "support/SampleCurves.h"
+#include "support/TemporaryFolder.h"
 
 namespace {
 
@@ -18,7 +18,7 @@ class Page : public testing::Test {
 protected:
     std::string path(const std::string& name = "r.html") const
     {
-        return itsFiles.directory() + '/' + name;
+        return itsFiles.path(name);
     }
 
     std::string page(const std::vector<Curve>& curves, const RunDescription& run = {}) const
@@ -27,7 +27,7 @@ protected:
         return itsFiles.read("r.html");
     }
 
-    const support::CommandRunner itsFiles{"none"};
+    const support::TemporaryFolder itsFiles;
 };
 
 std::size_t count(const std::string& text, const std::string& part)
@@ -131,7 +131,7 @@ TEST_F(Page, IsWrittenWhollyOrNotAtAll)
         }
     }
     page({});
-    EXPECT_EQ(std::distance(std::filesystem::directory_iterator(itsFiles.directory()), {}), 1);
+    EXPECT_EQ(std::distance(std::filesystem::directory_iterator(itsFiles.path()), {}), 1);
 }
 
 }  // namespace

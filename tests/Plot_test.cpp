@@ -10,8 +10,8 @@
 #include <filesystem>
 
 #include "support/CommaLocale.h"
-#include "support/CommandRunner.h"
 #include "support/SampleCurves.h"
+#include "support/TemporaryFolder.h"
 
 namespace {
 
@@ -41,7 +41,7 @@ class Plot : public testing::Test {
 protected:
     std::string path(const std::string& name) const
     {
-        return itsFiles.directory() + '/' + name;
+        return itsFiles.path(name);
     }
 
     std::string drawn(const std::string& name, const std::vector<Curve>& curves = support::sampleCurves()) const
@@ -59,17 +59,7 @@ protected:
         return path("bin");
     }
 
-    std::vector<std::string> names() const
-    {
-        std::vector<std::string> found;
-        for (const auto& entry : std::filesystem::directory_iterator(itsFiles.directory())) {
-            found.push_back(entry.path().filename().string());
-        }
-        std::sort(found.begin(), found.end());
-        return found;
-    }
-
-    const support::CommandRunner itsFiles{"none"};
+    const support::TemporaryFolder itsFiles;
 };
 
 template <class Function>
@@ -96,7 +86,7 @@ TEST_F(Plot, TheSuffixTellsTheFormat)
     EXPECT_EQ(drawn("a.svg").substr(0, 5), "<?xml");
     EXPECT_EQ(drawn("a.png").substr(0, 8), "\x89PNG\r\n\x1a\n");
     EXPECT_EQ(drawn("a.pdf").substr(0, 5), "%PDF-");
-    EXPECT_EQ(names(), (std::vector<std::string>{"a.pdf", "a.png", "a.svg"}));
+    EXPECT_EQ(itsFiles.names(), (std::vector<std::string>{"a.pdf", "a.png", "a.svg"}));
 }
 
 TEST_F(Plot, CheckingLeavesNothing)
@@ -104,7 +94,7 @@ TEST_F(Plot, CheckingLeavesNothing)
     for (const char* const name : {"a.svg", "a.png", "a.pdf"}) {
         checkPlot(path(name));
     }
-    EXPECT_TRUE(names().empty());
+    EXPECT_TRUE(itsFiles.names().empty());
     itsFiles.write("a.svg", "old");
     checkPlot(path("a.svg"));
     EXPECT_EQ(itsFiles.read("a.svg"), "old");
@@ -124,17 +114,17 @@ TEST_F(Plot, RefusesPlacesWhereNothingCanBeWritten)
     std::filesystem::create_directory(path("folder.svg"));
     const std::string said = refusal([this] { checkPlot(path("folder.svg")); });
     EXPECT_EQ(said.rfind(path("folder.svg") + ": ", 0), 0U) << said;
-    EXPECT_EQ(names(), std::vector<std::string>{"folder.svg"});
+    EXPECT_EQ(itsFiles.names(), std::vector<std::string>{"folder.svg"});
 }
 
 TEST_F(Plot, SaysWhenGnuplotIsMissing)
 {
-    const ProgramsIn programs(itsFiles.directory());
+    const ProgramsIn programs(itsFiles.path());
     EXPECT_EQ(
         sayings(path("a.svg")),
         path("a.svg") +
             ": is drawn by gnuplot (Debian's package gnuplot-nox), which cannot be started: No such file or directory");
-    EXPECT_TRUE(names().empty());
+    EXPECT_TRUE(itsFiles.names().empty());
 }
 
 TEST_F(Plot, SaysWhatGnuplotSaysAndKeepsWhatWasThere)
@@ -146,7 +136,7 @@ TEST_F(Plot, SaysWhatGnuplotSaysAndKeepsWhatWasThere)
                    "printf '%s\\n' 'set terminal' '   ^' '     line 0: unknown terminal' '' >&2\nexit 1\n"));
     EXPECT_EQ(sayings(path("a.png")), path("a.png") + ": cannot be drawn: gnuplot says: line 0: unknown terminal");
     EXPECT_EQ(itsFiles.read("a.png"), "old");
-    EXPECT_EQ(names(), (std::vector<std::string>{"a.png", "bin"}));
+    EXPECT_EQ(itsFiles.names(), (std::vector<std::string>{"a.png", "bin"}));
 }
 
 TEST_F(Plot, SaysWhenGnuplotWasEndedByASignal)
@@ -168,14 +158,14 @@ TEST_F(Plot, FilesMayHaveAnyName)
 {
     const std::string name = "a'b \"c\" `touch x`; $(touch y) \\ # %d\n\xff.svg";
     EXPECT_EQ(drawn(name).substr(0, 5), "<?xml");
-    EXPECT_EQ(names(), std::vector<std::string>{name});
+    EXPECT_EQ(itsFiles.names(), std::vector<std::string>{name});
 }
 
 TEST_F(Plot, TheUsersOwnSettingsHaveNoSay)
 {
     itsFiles.write(".gnuplot", "exit status 3\n");
     const std::string home = std::getenv("HOME") == nullptr ? "/" : std::getenv("HOME");
-    setenv("HOME", itsFiles.directory().c_str(), 1);
+    setenv("HOME", itsFiles.path().c_str(), 1);
     const std::string picture = drawn("a.svg");
     setenv("HOME", home.c_str(), 1);
     EXPECT_EQ(picture.substr(0, 5), "<?xml");

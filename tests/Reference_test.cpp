@@ -7,7 +7,7 @@
 #include <filesystem>
 
 #include "support/CommaLocale.h"
-#include "support/CommandRunner.h"
+#include "support/TemporaryFolder.h"
 
 namespace {
 
@@ -34,10 +34,10 @@ protected:
 
     std::string path(const std::string& name = "rates.csv") const
     {
-        return itsFiles.directory() + '/' + name;
+        return itsFiles.path(name);
     }
 
-    const support::CommandRunner itsFiles{"none"};
+    const support::TemporaryFolder itsFiles;
 };
 
 Curve readOnly(const std::string& name)
