@@ -10,6 +10,7 @@ import sys
 import tempfile
 import unittest
 
+sys.dont_write_bytecode = True  # the tree stays as it is
 from support.browser import Browser
 
 EXAMPLE = pathlib.Path(sys.argv[1]).resolve()
