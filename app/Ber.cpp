@@ -14,6 +14,7 @@
 #include "Decoder.h"
 #include "Interruption.h"
 #include "LiveTable.h"
+#include "Pictures.h"
 #include "simulation/AtomicFile.h"
 #include "simulation/Error.h"
 #include "simulation/Journal.h"
@@ -51,6 +52,7 @@ void checkInstructionSet(const std::string& name)
 int simulate(const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
+    const Pictures pictures(options.pictures);
     std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
     if (options.resume && journal.isEmpty()) {
@@ -66,6 +68,9 @@ int simulate(const BerOptions& options, const simulation::Plan& plan)
             return Interruption::signal() != 0;
         };
         isComplete = run(plan, {workers, journal, *progress, isInterrupted, options.secondsBetweenCheckpoints});
+    }
+    if (!journal.ended().empty()) {
+        pictures.draw(plan, journal.ended());
     }
     if (isComplete) {
         return success;

@@ -316,6 +316,20 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
         ->type_name("POINT:FRAME");
 }
 
+void addPictureOptions(CLI::App& command, PictureOptions& pictures)
+{
+    command.add_option("--plot", pictures.plot, "Draw the curves, as SVG, PNG or PDF by the ending .svg, .png or .pdf")
+        ->type_name("FILE");
+    command.add_option("--report", pictures.report, "Write a page for a browser: curves, table, parameters")
+        ->type_name("FILE.html");
+    command
+        .add_option("--reference",
+                    pictures.references,
+                    "Draw the error rates of a CSV file, too, such as another result; can be given several times")
+        ->type_name("FILE.csv")
+        ->allow_extra_args(false);
+}
+
 // ---- The command that repeats a run
 
 template <class Values, class Text>
@@ -392,6 +406,7 @@ void addBerOptions(CLI::App& command, BerOptions& options)
     addSweepOptions(command, options.sweep);
     addRuleOptions(command, options);
     addExecutionOptions(command, options);
+    addPictureOptions(command, options.pictures);
 }
 
 simulation::Plan planOf(const BerOptions& options)

@@ -8,6 +8,7 @@
 #include <optional>
 #include <string>
 
+#include "Pictures.h"
 #include "simulation/Plan.h"
 
 namespace morvik {
@@ -36,6 +37,7 @@ struct BerOptions {
     double secondsBetweenCheckpoints = 3;
     bool resume = false;
     bool quiet = false;
+    PictureOptions pictures;
     std::optional<ReplayedFrame> replay;
 };
 

@@ -8,7 +8,6 @@
 #include <optional>
 #include <system_error>
 
-#include "Confidence.h"
 #include "Thousandths.h"
 #include "standard/BlockSizes.h"
 
@@ -28,16 +27,6 @@ std::string numberText(double value, Format... format)
 std::string rateText(double rate)
 {
     return numberText(rate, std::chars_format::scientific, 6);
-}
-
-Bounds bitBounds(const ResultRow& row)
-{
-    return bitErrorBounds(row.errors, row.frames.size(), row.point.blockSize);
-}
-
-Bounds blockBounds(const ResultRow& row)
-{
-    return blockErrorBounds(row.errors, row.frames.size());
 }
 
 template <class Number>
@@ -148,11 +137,11 @@ const std::vector<Column> allColumns = {
      [](const Row& row) { return std::to_string(row.errors.bitErrorSquares); },
      [](Text field, Row& row) { return readNumber(field, row.errors.bitErrorSquares); }},
     {"ber", number, [](const Row& row) { return rateText(bitErrorRate(row)); }, skip},
-    {"ber_low", number, [](const Row& row) { return rateText(bitBounds(row).low); }, skip},
-    {"ber_high", number, [](const Row& row) { return rateText(bitBounds(row).high); }, skip},
+    {"ber_low", number, [](const Row& row) { return rateText(bitErrorBounds(row).low); }, skip},
+    {"ber_high", number, [](const Row& row) { return rateText(bitErrorBounds(row).high); }, skip},
     {"bler", number, [](const Row& row) { return rateText(blockErrorRate(row)); }, skip},
-    {"bler_low", number, [](const Row& row) { return rateText(blockBounds(row).low); }, skip},
-    {"bler_high", number, [](const Row& row) { return rateText(blockBounds(row).high); }, skip},
+    {"bler_low", number, [](const Row& row) { return rateText(blockErrorBounds(row).low); }, skip},
+    {"bler_high", number, [](const Row& row) { return rateText(blockErrorBounds(row).high); }, skip},
     {"clipped_values", number,
      [](const Row& row) { return std::to_string(row.clipped); },
      [](Text field, Row& row) { return readNumber(field, row.clipped); }},

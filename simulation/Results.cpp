@@ -27,4 +27,14 @@ double clippedFraction(const ResultRow& row)
     return share(row.clipped, row.frames.size() * 3 * (row.point.blockSize + 4));
 }
 
+Bounds bitErrorBounds(const ResultRow& row)
+{
+    return bitErrorBounds(row.errors, row.frames.size(), row.point.blockSize);
+}
+
+Bounds blockErrorBounds(const ResultRow& row)
+{
+    return blockErrorBounds(row.errors, row.frames.size());
+}
+
 }  // namespace simulation

@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "Confidence.h"
 #include "Frames.h"
 #include "Point.h"
 #include "Tally.h"
@@ -36,6 +37,10 @@ struct Results {
 double bitErrorRate(const ResultRow& row);
 double blockErrorRate(const ResultRow& row);
 double clippedFraction(const ResultRow& row);
+
+/// The bounds of its rates.
+Bounds bitErrorBounds(const ResultRow& row);
+Bounds blockErrorBounds(const ResultRow& row);
 
 }  // namespace simulation
 
