@@ -1,0 +1,81 @@
+// morvik ber: the plot and the report that it leaves.
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "support/BerTest.h"
+
+namespace {
+
+using namespace support;
+
+class BerPictures : public BerTest {
+protected:
+    /// Expects that the run is refused in this line, before anything is simulated or written.
+    void expectRefusedAtOnce(const std::string& options, const std::string& line) const
+    {
+        SCOPED_TRACE(options);
+        const std::vector<std::string> before = morvik.names();
+        expectRefused(words("ber --block-size 40 --ebn0 0 --output results.csv " + options), "morvik ber: " + line);
+        EXPECT_EQ(morvik.names(), before);
+    }
+};
+
+const Arguments twoCurves =
+    words("--block-size 40 --algorithm max-log,scaled --ebn0 0,2 --max-blocks 300 --block-errors 1000");
+
+std::size_t countOf(const std::string& part, const std::string& text)
+{
+    std::size_t count = 0;
+    for (std::size_t at = text.find(part); at != std::string::npos; at = text.find(part, at + 1)) {
+        ++count;
+    }
+    return count;
+}
+
+TEST_F(BerPictures, ShowEachCurveAndTheReferences)
+{
+    morvik.write("other.csv", "# title: another decoder\nebn0_db,ber,fer\n0,1e-1,5e-1\n1,1e-2,1e-1\n");
+    ber(twoCurves + words("--plot curves.svg --report report.html --reference other.csv"));
+    for (const char* file : {"curves.svg", "report.html"}) {
+        SCOPED_TRACE(file);
+        const std::string text = morvik.read(file);
+        EXPECT_NE(text.find("K = 40, 4 units, max-log, 8 iterations"), std::string::npos);
+        EXPECT_NE(text.find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
+        EXPECT_NE(text.find("another decoder"), std::string::npos);
+    }
+    EXPECT_EQ(morvik.names(), (std::vector<std::string>{"curves.svg", "other.csv", "report.html"}));
+}
+
+TEST_F(BerPictures, TellHowTheRunIsRepeated)
+{
+    const Arguments run = twoCurves + words("--seed 7");
+    const std::string rates = berFile(run + words("--report report.html"));
+    const std::string page = morvik.read("report.html");
+    EXPECT_NE(page.find("morvik ber --block-size 40 --num-pu 4 --algorithm max-log,scaled"), std::string::npos);
+    EXPECT_NE(page.find("--seed 7"), std::string::npos);
+    for (const CsvRow& row : csvRows(rates)) {
+        EXPECT_GE(countOf(row.at("bit_errors"), page), 1U) << row.at("bit_errors");
+    }
+}
+
+TEST_F(BerPictures, AreDrawnOfEarlierResultsToo)
+{
+    berFile(twoCurves);
+    ber(twoCurves + words("--output results.csv --resume --plot again.svg"));
+    EXPECT_NE(morvik.read("again.svg").find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
+}
+
+TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)
+{
+    expectRefusedAtOnce("--plot curves.gif",
+                        "curves.gif: a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
+    expectRefusedAtOnce("--plot nowhere/curves.svg", "nowhere/curves.svg: No such file or directory");
+    expectRefusedAtOnce("--report nowhere/report.html", "nowhere/report.html: No such file or directory");
+    expectRefusedAtOnce("--reference nothing.csv", "nothing.csv: No such file or directory");
+    morvik.write("bad.csv", "ebn0_db,ber\n0,much\n");
+    expectRefusedAtOnce("--reference bad.csv",
+                        "bad.csv:2: \"much\" in the column ber is not allowed, allowed are numbers from 0 to 1");
+}
+
+}  // namespace
