@@ -4,9 +4,10 @@
 
 #include <charconv>
 #include <optional>
-#include <string>
 #include <string_view>
 #include <system_error>
+
+#include "simulation/Shown.h"
 
 namespace morvik {
 
@@ -23,18 +24,7 @@ std::optional<Integer> parseInteger(std::string_view text)
     return value;
 }
 
-/// The text in quotation marks, fit for a one-line message: cut when long, with ? for what does not print.
-inline std::string shown(std::string_view text)
-{
-    constexpr std::size_t longest = 40;
-    std::string start(text.substr(0, longest));
-    for (char& c : start) {
-        if (c < ' ' || c > '~') {
-            c = '?';
-        }
-    }
-    return '"' + start + (text.size() > longest ? "...\"" : "\"");
-}
+using simulation::shown;
 
 }  // namespace morvik
 

@@ -85,7 +85,7 @@ stage_threads() {
 # Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead;
 # FUZZ_CORPUS names a folder that keeps what long runs find, and where the next run goes on.
 stage_fuzz() {
-    local fuzzers=(csv_fuzz property_strings_fuzz simulate_fuzz state_fuzz text_fuzz)
+    local fuzzers=(csv_fuzz property_strings_fuzz results_fuzz simulate_fuzz state_fuzz text_fuzz)
     scripts/build fuzz "${fuzzers[@]}"
     local fuzzer log=build/fuzz/log corpus=${FUZZ_CORPUS:-}
     if [ -z "$corpus" ]; then

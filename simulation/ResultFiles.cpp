@@ -10,6 +10,7 @@
 #include "AtomicFile.h"
 #include "Columns.h"
 #include "Error.h"
+#include "Shown.h"
 #include "TextFile.h"
 
 namespace simulation {
@@ -34,7 +35,7 @@ std::string headerLine()
 void readField(const Column& column, const std::string& text, ResultRow& row, const std::string& place)
 {
     if (!column.read(text, row)) {
-        throw Error(place + ": " + std::string(column.name) + " \"" + text.substr(0, 40) + "\" is not allowed");
+        throw Error(place + ": " + std::string(column.name) + ' ' + shown(text) + " is not allowed");
     }
 }
 
@@ -78,15 +79,27 @@ ResultRow csvRow(const std::string& line, const std::string& place)
     return row;
 }
 
+/// Reads a line, which ends in \n or \r\n.
+bool nextLine(std::istream& lines, std::string& line)
+{
+    if (!std::getline(lines, line)) {
+        return false;
+    }
+    if (!line.empty() && line.back() == '\r') {
+        line.pop_back();
+    }
+    return true;
+}
+
 Results parseCsv(const std::string& text, const std::string& fileName)
 {
     std::istringstream lines(text);
     std::string line;
-    if (!std::getline(lines, line) || line != headerLine()) {
+    if (!nextLine(lines, line) || line != headerLine()) {
         throw Error(fileName + ":1: no header of a result file, expected \"" + headerLine() + '"');
     }
     Results results;
-    for (std::size_t number = 2; std::getline(lines, line); ++number) {
+    for (std::size_t number = 2; nextLine(lines, line); ++number) {
         results.rows.push_back(csvRow(line, fileName + ':' + std::to_string(number)));
     }
     return results;
@@ -201,8 +214,13 @@ void writeResults(const std::string& fileName, const Results& results)
 
 Results readResults(const std::string& fileName)
 {
+    formatOf(fileName);  // before the file is opened
+    return parseResults(readText(fileName), fileName);
+}
+
+Results parseResults(const std::string& text, const std::string& fileName)
+{
     const ResultFormat format = formatOf(fileName);
-    const std::string text = readText(fileName);
     return format == ResultFormat::csv ? parseCsv(text, fileName) : parseJson(text, fileName);
 }
 

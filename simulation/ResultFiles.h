@@ -23,6 +23,9 @@ void writeResults(const std::string& fileName, const Results& results);
 /// Reads a file of either format. Throws Error with the place of what is wrong.
 Results readResults(const std::string& fileName);
 
+/// Reads the content of such a file.
+Results parseResults(const std::string& text, const std::string& fileName);
+
 }  // namespace simulation
 
 #endif

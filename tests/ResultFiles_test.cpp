@@ -130,6 +130,24 @@ TEST_F(ResultFiles, WithMistakesAreRefusedWithTheirPlaces)
     EXPECT_EQ(refusal("a.csv", csvWith(",1.2.3", ",")), "a.csv:2: version \"\" is not allowed");
 }
 
+TEST_F(ResultFiles, CanHaveLinesThatEndInCarriageReturns)
+{
+    const std::string text = csvText(exampleResults());
+    std::string windows;
+    for (const char c : text) {
+        windows += c == '\n' ? "\r\n" : std::string(1, c);
+    }
+    EXPECT_EQ(csvText(parseResults(windows, "a.csv")), text);
+}
+
+TEST_F(ResultFiles, AreShownInPrintableTextWhereTheyAreWrong)
+{
+    EXPECT_EQ(refusal("a.csv", csvWith(",scaled,", ",\x1b[31mscaled,")),
+              "a.csv:2: algorithm \"?[31mscaled\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,", ',' + std::string(1000, '1') + ',')),
+              "a.csv:2: frames \"" + std::string(40, '1') + "...\" is not allowed");
+}
+
 TEST_F(ResultFiles, WithImpossibleCountsAreRefused)
 {
     const std::string cannotBe = "a.csv:2: numbers of errors that cannot be";
