@@ -33,12 +33,20 @@ public:
     void hasEnded(const simulation::PointResult&) override {}
 };
 
-std::unique_ptr<simulation::Progress> progressOf(const BerOptions& options, const simulation::Plan& plan)
+std::unique_ptr<simulation::Progress> progressOf(const BerMeans& means,
+                                                 const BerOptions& options,
+                                                 const simulation::Plan& plan)
 {
     if (options.quiet) {
         return std::make_unique<NoTable>();
     }
-    return std::make_unique<LiveTable>(plan, std::cout, terminalWidth());
+    return std::make_unique<LiveTable>(plan, std::cout, means.hasTerminal ? terminalWidth() : std::nullopt);
+}
+
+std::unique_ptr<simulation::Workers> makeThreads(const BerOptions& options, const simulation::Plan& plan)
+{
+    const unsigned threads = options.threads > 0 ? options.threads : std::max(std::thread::hardware_concurrency(), 1U);
+    return std::make_unique<simulation::ThreadWorkers>(plan, threads, options.instructionSet);
 }
 
 /// Throws Refusal, with the decoder's reason, if it knows no such instruction set.
@@ -49,25 +57,24 @@ void checkInstructionSet(const std::string& name)
     }
 }
 
-int simulate(const BerOptions& options, const simulation::Plan& plan)
+int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
     const Pictures pictures(options.pictures);
+    const Interruption interruption;
     std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
     if (options.resume && journal.isEmpty()) {
-        std::cerr << "morvik ber: nothing to resume, starts from the beginning" << std::endl;
+        std::cerr << means.command << ": nothing to resume, starts from the beginning" << std::endl;
     }
-    const unsigned threads = options.threads > 0 ? options.threads : std::max(std::thread::hardware_concurrency(), 1U);
-    const Interruption interruption;
     bool isComplete = false;
     {
-        simulation::ThreadWorkers workers(plan, threads, options.instructionSet);
-        const auto progress = progressOf(options, plan);
+        const auto workers = means.makeWorkers(options, plan);
+        const auto progress = progressOf(means, options, plan);
         const auto isInterrupted = [] {
             return Interruption::signal() != 0;
         };
-        isComplete = run(plan, {workers, journal, *progress, isInterrupted, options.secondsBetweenCheckpoints});
+        isComplete = run(plan, {*workers, journal, *progress, isInterrupted, options.secondsBetweenCheckpoints});
     }
     if (!journal.ended().empty()) {
         pictures.draw(plan, journal.ended());
@@ -75,7 +82,7 @@ int simulate(const BerOptions& options, const simulation::Plan& plan)
     if (isComplete) {
         return success;
     }
-    std::cerr << "morvik ber: interrupted"
+    std::cerr << means.command << ": interrupted"
               << (options.output.empty() ? "" : ", --resume goes on from " + journal.checkpointName()) << std::endl;
     return 128 + Interruption::signal();
 }
@@ -102,11 +109,11 @@ int replayFrame(const BerOptions& options, const simulation::Plan& plan, const R
     return success;
 }
 
-int ber(const BerOptions& options)
+int ber(const BerMeans& means, const BerOptions& options)
 {
     const simulation::Plan plan = planOf(options);
     checkInstructionSet(options.instructionSet);
-    return options.replay ? replayFrame(options, plan, *options.replay) : simulate(options, plan);
+    return options.replay ? replayFrame(options, plan, *options.replay) : simulate(means, options, plan);
 }
 
 /// The end of the help text.
@@ -125,12 +132,17 @@ Example: the waterfall of 512 bits for two and eight units
 
 Command addBer(CLI::App& app)
 {
+    return addBer(app, {"morvik ber", makeThreads, true});
+}
+
+Command addBer(CLI::App& app, const BerMeans& means)
+{
     CLI::App* command = app.add_subcommand("ber", "Simulate bit and block error rates");
     const auto options = std::make_shared<BerOptions>();
     addBerOptions(*command, *options);
     command->footer(explanation);
-    const auto run = [options] {
-        return ber(*options);
+    const auto run = [means, options] {
+        return ber(means, *options);
     };
     return {command, run};
 }

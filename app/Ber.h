@@ -2,12 +2,31 @@
 #ifndef MORVIK_BER_H
 #define MORVIK_BER_H
 
+#include <functional>
+#include <memory>
+#include <string>
+
+#include "BerOptions.h"
 #include "Command.h"
+#include "simulation/Workers.h"
 
 namespace morvik {
 
-/// Adds `ber` to the command line.
+/// What the programs that have the subcommand do differently.
+struct BerMeans {
+    std::string command;  // how messages begin
+
+    /// Makes whoever simulates the frames of a run. The plan outlives them.
+    std::function<std::unique_ptr<simulation::Workers>(const BerOptions& options, const simulation::Plan& plan)>
+        makeWorkers;
+    bool hasTerminal = false;  // whether standard output may be the user's terminal
+};
+
+/// Adds `ber` to the command line, for runs in threads of this process.
 Command addBer(CLI::App& app);
+
+/// Adds `ber` to the command line.
+Command addBer(CLI::App& app, const BerMeans& means);
 
 }  // namespace morvik
 

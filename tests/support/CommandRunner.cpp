@@ -51,6 +51,11 @@ Process::Process(const std::string& program,
     }
 }
 
+pid_t Process::id() const
+{
+    return itsId;
+}
+
 // NOLINTNEXTLINE(readability-make-member-function-const): the process is gone afterwards.
 int Process::wait()
 {

@@ -27,6 +27,8 @@ public:
             const std::string& directory,
             const int (&streams)[3]);
 
+    pid_t id() const;
+
     /// Sends it a signal.
     void send(int signal);
 

@@ -1,0 +1,55 @@
+// CommandLine: what happens between the arguments of a program and its exit status.
+#include "CommandLine.h"
+
+#include <exception>
+#include <iostream>
+#include <string>
+
+namespace morvik {
+
+namespace {
+
+/// Writes the one line that ends a failed command.
+int fail(const std::string& name, const std::string& what)
+{
+    std::cerr << name << ": " << what << std::endl;
+    return badInputOrUsage;
+}
+
+int reportUsage(const CLI::App& app, const CLI::ParseError& error)
+{
+    const auto named = app.get_subcommands();
+    const std::string name = named.empty() ? app.get_name() : app.get_name() + ' ' + named.front()->get_name();
+    return fail(name, std::string(error.what()) + "; '" + name + " --help' tells what is allowed");
+}
+
+int run(const CLI::App& app, const Command& command)
+{
+    try {
+        return command.run();
+    } catch (const std::exception& error) {
+        return fail(app.get_name() + ' ' + command.arguments->get_name(), error.what());
+    }
+}
+
+}  // namespace
+
+int runCommandLine(CLI::App& app, const std::vector<Command>& commands, int argc, const char* const* argv)
+{
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::Success& helpOrVersion) {
+        return app.exit(helpOrVersion);
+    } catch (const CLI::ParseError& error) {
+        return reportUsage(app, error);
+    }
+    for (const Command& command : commands) {
+        if (command.arguments->parsed()) {
+            return run(app, command);
+        }
+    }
+    std::cerr << app.help();
+    return badInputOrUsage;
+}
+
+}  // namespace morvik

@@ -1,0 +1,144 @@
+// Packing: batches and their results as bytes, the same on every machine.
+#include "Packing.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <cstdint>
+#include <stdexcept>
+
+namespace simulation {
+
+namespace {
+
+/// Appends a number in pieces of seven bits, the lowest first. The highest bit of a byte tells that more follow.
+void put(std::uint64_t number, std::string& bytes)
+{
+    while (number >= 0x80) {
+        bytes += static_cast<char>(0x80 | (number & 0x7f));
+        number >>= 7;
+    }
+    bytes += static_cast<char>(number);
+}
+
+void putBatch(const FrameBatch& batch, std::string& bytes)
+{
+    put(batch.point, bytes);
+    put(batch.first, bytes);
+    put(batch.count, bytes);
+}
+
+/// Takes numbers from bytes.
+class Reader {
+public:
+    explicit Reader(std::string_view bytes) : itsBytes(bytes) {}
+
+    bool isAtEnd() const
+    {
+        return itsBytes.empty();
+    }
+
+    /// The next number, if it is at most `most`.
+    std::uint64_t get(std::uint64_t most = UINT64_MAX)
+    {
+        std::uint64_t number = 0;
+        bool goesOn = true;
+        for (unsigned shift = 0; goesOn; shift += 7) {
+            expect(!itsBytes.empty() && shift < 64);
+            const auto byte = static_cast<unsigned char>(itsBytes.front());
+            itsBytes.remove_prefix(1);
+            number |= std::uint64_t{byte & 0x7fU} << shift;
+            goesOn = (byte & 0x80U) != 0;
+        }
+        expect(number <= most);
+        return number;
+    }
+
+    std::uint32_t get32()
+    {
+        return static_cast<std::uint32_t>(get(UINT32_MAX));
+    }
+
+    static void expect(bool isGood)
+    {
+        if (!isGood) {
+            throw std::runtime_error("a message is damaged");
+        }
+    }
+
+private:
+    std::string_view itsBytes;
+};
+
+FrameBatch batchFrom(Reader& reader)
+{
+    FrameBatch batch;
+    batch.point = static_cast<std::size_t>(reader.get(SIZE_MAX));
+    batch.first = reader.get();
+    batch.count = reader.get32();
+    return batch;
+}
+
+}  // namespace
+
+std::string packed(const FrameBatch& batch)
+{
+    std::string bytes;
+    putBatch(batch, bytes);
+    return bytes;
+}
+
+std::string packed(const BatchResult& result)
+{
+    std::string bytes;
+    putBatch(result.batch, bytes);
+    const std::size_t counts = result.clipped.empty() ? 0 : result.wrongBits.size() / result.clipped.size();
+    put(counts, bytes);
+    std::size_t next = 0;  // the first frame that nothing has been told of
+    for (std::size_t frame = 0; frame < result.clipped.size(); ++frame) {
+        const std::uint32_t* const wrongBits = result.wrongBits.data() + frame * counts;
+        const bool isQuiet = std::all_of(wrongBits, wrongBits + counts, [](std::uint32_t wrong) { return wrong == 0; });
+        if (isQuiet && result.clipped[frame] == 0) {
+            continue;
+        }
+        put(frame - next, bytes);
+        put(result.clipped[frame], bytes);
+        for (std::size_t i = 0; i < counts; ++i) {
+            put(wrongBits[i], bytes);
+        }
+        next = frame + 1;
+    }
+    return bytes;
+}
+
+FrameBatch unpackedBatch(std::string_view bytes)
+{
+    Reader reader(bytes);
+    const FrameBatch batch = batchFrom(reader);
+    Reader::expect(reader.isAtEnd());
+    return batch;
+}
+
+BatchResult unpackedResult(std::string_view bytes)
+{
+    Reader reader(bytes);
+    BatchResult result;
+    result.batch = batchFrom(reader);
+    constexpr std::uint64_t mostCounts = 15;  // iterations of the decoder
+    const auto counts = static_cast<std::size_t>(reader.get(mostCounts));
+    const std::size_t frames = result.batch.count;
+    result.clipped.resize(frames);
+    result.wrongBits.resize(frames * counts);
+    std::size_t frame = 0;
+    while (!reader.isAtEnd()) {
+        frame += static_cast<std::size_t>(reader.get(frames));
+        Reader::expect(frame < frames);
+        result.clipped[frame] = reader.get32();
+        for (std::size_t i = 0; i < counts; ++i) {
+            result.wrongBits[frame * counts + i] = reader.get32();
+        }
+        ++frame;
+    }
+    return result;
+}
+
+}  // namespace simulation
