@@ -309,6 +309,27 @@ TEST_F(BerRuns, InPartsAreJoinedToTheWhole)
     EXPECT_NE(json.find("\"command\": \"morvik merge a.csv b.json c.csv\""), std::string::npos);
 }
 
+// Each task of the array runs the script with its number.
+TEST_F(BerRuns, OfAJobArrayAreJoinedToTheWhole)
+{
+    const Arguments run = words("--block-size 40,104 --ebn0 0:1:2");
+    const std::string whole = berFile(run + words("--frames 200:500"), "whole.csv");
+    const CommandRunner shell("/bin/bash");
+    const std::string task = "SLURM_ARRAY_TASK_ID=$i bash " MORVIK_EXAMPLES "/slurm_array.sh \"$@\"";
+    const std::string tasks = "export MORVIK=\"$1\" BLOCKS=100; shift; for i in 2 3 4 3; do " + task + " || exit; done";
+    const CommandResult array = shell.run(Arguments{"-ec", tasks, "bash", morvik.program()} + run);
+    EXPECT_EQ(array.status, 0) << array.err;
+    EXPECT_EQ(shell.names(), words("task_2.csv task_3.csv task_4.csv"));
+    const std::string merge = "\"$1\" merge task_*.csv --output all.csv";
+    const CommandResult merged = shell.run({"-ec", merge, "bash", morvik.program()});
+    EXPECT_EQ(merged.status, 0) << merged.err;
+    EXPECT_EQ(withoutTimes(shell.read("all.csv")), whole);
+
+    const CommandResult noTask = shell.run({MORVIK_EXAMPLES "/slurm_array.sh"});
+    EXPECT_NE(noTask.status, 0);
+    EXPECT_NE(noTask.err.find("SLURM_ARRAY_TASK_ID: is set by Slurm"), std::string::npos) << noTask.err;
+}
+
 TEST_F(BerRuns, ThatShareFramesAreNotJoined)
 {
     const Arguments run = words("--block-size 40 --ebn0 0 --frames");
