@@ -25,8 +25,11 @@ const Arguments manyPoints = words(
 /// A point with as many frames as some batches have.
 const Arguments eachIteration = words("--block-size 512 --ebn0 0.7 --frames 7:5000 --iterations 3 --each-iteration");
 
-/// A point that takes a while.
-const Arguments longPoint = words("--block-size 512 --ebn0 1.4 --frames 0:100000");
+/// A point that takes a second or more.
+const Arguments longPoint = words("--block-size 512 --ebn0 1.4 --frames 0:400000");
+
+/// A point that takes several.
+const Arguments longerPoint = words("--block-size 512 --ebn0 1.4 --frames 0:2500000");
 
 /// Whether the condition comes true within a minute.
 bool comesTrue(const std::function<bool()>& condition)
@@ -40,10 +43,12 @@ bool comesTrue(const std::function<bool()>& condition)
     return false;
 }
 
+/// What can be read of a file: nothing of a folder, nor of a process that ends meanwhile.
 std::string contentOf(const std::string& path)
 {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
+    std::ostringstream content;
+    content << std::ifstream(path, std::ios::binary).rdbuf();
+    return content.str();
 }
 
 /// The process of a rank that mpirun has started; 0 if there is none.
@@ -238,18 +243,18 @@ TEST_F(MpiRuns, ThatLoseARankKeepTheirCheckpoint)
     }
 }
 
-// mpirun sends SIGTERM to the ranks, and kills them after a second, or the time that it is told here.
+// mpirun waits for a second, sends SIGTERM to the ranks, waits again and kills them; for longer if it is told so.
 TEST_F(MpiRuns, EndBySignalsWithACheckpoint)
 {
-    const std::string expected = berFile(longPoint, "results.csv");
+    const std::string expected = berFile(longerPoint, "results.csv");
     for (const int signal : {SIGINT, SIGTERM}) {
-        Process process = start(longPoint + neverSaved, words("--mca odls_base_sigkill_timeout 4"));
+        Process process = start(longerPoint + neverSaved, words("--mca odls_base_sigkill_timeout 2"));
         ASSERT_TRUE(comesTrue([this] { return !checkpoint().empty(); }));
         ASSERT_FALSE(isCounting());
         process.send(signal);
         EXPECT_NE(process.wait(), 0);
         EXPECT_TRUE(isCounting());
-        EXPECT_EQ(mpiFile(3, longPoint + Arguments{"--resume"}, "results.csv"), expected);
+        EXPECT_EQ(mpiFile(3, longerPoint + Arguments{"--resume"}, "results.csv"), expected);
     }
 }
 
