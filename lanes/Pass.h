@@ -182,7 +182,7 @@ private:
     MORVIK_INLINE void forward(const Windows& windows, unsigned j, Column& a) const
     {
         std::int16_t* slot = itsSlots + windows.slot + j * count;
-        for (unsigned i = 0; i < windows.length; ++i) {
+        for (std::size_t i = 0; i < windows.length; ++i) {
             forwardStep(at(windows, j, i), slot, a);
             slot += windows.direction;
         }
@@ -193,7 +193,7 @@ private:
     MORVIK_INLINE void backward(const Windows& windows, unsigned steps, WideColumn& b) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(steps);
-        for (unsigned i = steps; i-- > 0;) {
+        for (std::size_t i = steps; i-- > 0;) {
             slot -= windows.direction;
             backwardStep<last>(windows, i, slot, b);
         }
@@ -205,7 +205,7 @@ private:
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
         std::int16_t* nextSlot = itsSlots + next.slot;
-        for (unsigned i = 0; i < next.length; ++i) {
+        for (std::size_t i = 0; i < next.length; ++i) {
             slot -= windows.direction;
             backwardStep<last>(windows, windows.length - 1 - i, slot, b);
             forwardStep(at(next, 0, i), nextSlot, a);
@@ -214,7 +214,7 @@ private:
     }
 
     /// Step `i` of all vectors' steps, into the window's lanes of a slot.
-    MORVIK_INLINE void forwardStep(unsigned i, std::int16_t* slot, Column& a) const
+    MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a) const
     {
         const std::uint32_t* const sources = itsInterleaver.sources + i * Lanes::sources;
         __builtin_prefetch(itsSource + sources[lanes::fetchAhead * Lanes::sources]);
@@ -232,7 +232,10 @@ private:
     }
 
     template <bool last>
-    MORVIK_INLINE void backwardStep(const Windows& windows, unsigned i, const std::int16_t* slot, WideColumn& b) const
+    MORVIK_INLINE void backwardStep(const Windows& windows,
+                                    std::size_t i,
+                                    const std::int16_t* slot,
+                                    WideColumn& b) const
     {
         const WideValue g0 = WideValue::load(slot + slotBranches);
         const WideValue g1 = WideValue::load(slot + slotBranches + wide);
@@ -254,12 +257,12 @@ private:
     }
 
     /// Step `i` of window `j` among the steps of all vectors.
-    MORVIK_INLINE unsigned at(const Windows& windows, unsigned j, unsigned i) const
+    MORVIK_INLINE std::size_t at(const Windows& windows, unsigned j, std::size_t i) const
     {
-        return windows.v * itsSteps + windows.from[j] + i;
+        return std::size_t{windows.v} * itsSteps + windows.from[j] + i;
     }
 
-    MORVIK_INLINE WideValue loadStep(const Windows& windows, unsigned i, const std::int16_t* rows) const
+    MORVIK_INLINE WideValue loadStep(const Windows& windows, std::size_t i, const std::int16_t* rows) const
     {
         const Value first = Value::load(rows + at(windows, 0, i) * count);
         if constexpr (abreast == 1) {
@@ -269,7 +272,7 @@ private:
         }
     }
 
-    MORVIK_INLINE void storeStep(const Windows& windows, unsigned i, WideValue value, std::int16_t* rows) const
+    MORVIK_INLINE void storeStep(const Windows& windows, std::size_t i, WideValue value, std::int16_t* rows) const
     {
         trellis::forEach<abreast>(
             [&](auto j) MORVIK_INLINE_LAMBDA { part<count, j>(value).store(rows + at(windows, j, i) * count); });
