@@ -139,7 +139,7 @@ MORVIK_INLINE Steps<count> part(Steps<wide> a)
     }
 }
 
-/// floor(3 a / 8), for any a whose threefold fits 17 bits.
+/// floor(3 a / 8), for any a whose threefold fits 16 bits.
 template <unsigned count>
 MORVIK_INLINE Steps<count> threeEighths(Steps<count> a)
 {
