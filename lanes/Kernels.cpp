@@ -11,7 +11,7 @@ namespace {
 template <unsigned count, unsigned vectors, unsigned mostAbreast = 1>
 struct Shape {
     static constexpr unsigned lanes = count * vectors;
-    using LanesOfRow = Permutation<count, vectors>;
+    using LanesOfRow = Permutation<count>;
 
     template <class Input>
     static bool load(const Input* const* arrays, unsigned steps, std::int16_t* rows)

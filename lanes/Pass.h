@@ -26,7 +26,7 @@ class Pass {
     static constexpr unsigned wide = abreast * count;
     using Value = Steps<count>;
     using WideValue = Steps<wide>;
-    using Lanes = Permutation<count, vectors>;
+    using Lanes = Permutation<count>;
     using Rule = RuleOf<count>;
     using WideRule = RuleOf<wide>;
     using Decision = typename Rule::Decision;

@@ -28,7 +28,7 @@ MORVIK_INLINE Steps<count> permuteWords(Steps<count> a, typename Steps<count>::V
 }
 
 /// An index word for each lane.
-template <unsigned count, unsigned vectors>
+template <unsigned count>
 struct Permutation {
     static constexpr unsigned group = count;
     static constexpr unsigned sources = 1;
@@ -55,7 +55,7 @@ struct Permutation {
 #elif defined(__SSSE3__)
 
 /// A byte shuffle within each sixteen bytes.
-template <unsigned count, unsigned vectors>
+template <unsigned count>
 struct Permutation {
     static constexpr unsigned group = 8;
     static constexpr unsigned sources = count / group;
@@ -91,7 +91,7 @@ struct Permutation {
 #else
 
 /// The source lanes themselves.
-template <unsigned count, unsigned vectors>
+template <unsigned count>
 struct Permutation {
     static constexpr unsigned group = 8;
     static constexpr unsigned sources = count / group;
