@@ -310,7 +310,7 @@ void LaneDecoder::ratios(std::int16_t* const* blocks)
 
 void LaneDecoder::joint(std::int16_t* const* blocks)
 {
-    spread(itsKernel->storeRatios, itsCurrent->space.constituent[itsLastDecoder == 0 ? 0 : 1].joint, blocks);
+    spread(itsKernel->storeRatios, itsCurrent->space.constituent[itsLastDecoder].joint, blocks);
 }
 
 LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
