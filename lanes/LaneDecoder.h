@@ -51,6 +51,7 @@ class LaneDecoder {
 public:
     LaneDecoder(const InstructionSet& instructionSet, Algorithm algorithm, const CorrectionTable& corrections);
 
+    /// One decoder cuts all blocks of a size alike: what was prepared for a size is taken up again.
     void setBlockCut(BlockCut cut);
 
     const BlockCut& blockCut() const
