@@ -17,12 +17,23 @@ namespace simulation {
 
 namespace {
 
-/// Where the content is to be: what the name is a link to, at last.
+/// As many links behind each other as Linux follows.
+constexpr int mostLinks = 40;
+
+/// Where the content is to be: what the name is a link to, at last, whether that is there yet or not.
 std::string placeOf(const std::string& fileName)
 {
-    std::error_code none;  // of a file that is not there yet
-    const std::filesystem::path place = std::filesystem::canonical(fileName, none);
-    return none ? fileName : place.string();
+    std::filesystem::path place = fileName;
+    for (int links = 0; links <= mostLinks; ++links) {
+        std::error_code none;  // of a link
+        const std::filesystem::path next = std::filesystem::read_symlink(place, none);
+        if (none) {
+            return place.string();
+        }
+        place = place.parent_path() / next;
+    }
+    errno = ELOOP;
+    throw fileError(fileName, "written");
 }
 
 std::string folderOf(const std::string& place)
@@ -148,6 +159,14 @@ void checkWritable(const std::string& fileName)
     if ((exists && access(place.c_str(), W_OK) != 0) || !NewFile(place).isMade()) {
         throw fileError(fileName, "written");
     }
+}
+
+bool isSamePlace(const std::string& a, const std::string& b)
+{
+    const auto whole = [](const std::string& fileName) {
+        return std::filesystem::weakly_canonical(std::filesystem::absolute(placeOf(fileName)));
+    };
+    return whole(a) == whole(b);
 }
 
 }  // namespace simulation

@@ -13,6 +13,9 @@ void writeAtomically(const std::string& fileName, const std::string& content);
 /// Throws Error unless writeAtomically can be expected to work.
 void checkWritable(const std::string& fileName);
 
+/// Whether what is written to one file would take the other's place. Throws Error if a link leads nowhere.
+bool isSamePlace(const std::string& a, const std::string& b);
+
 }  // namespace simulation
 
 #endif

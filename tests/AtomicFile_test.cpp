@@ -16,6 +16,7 @@ namespace {
 
 using simulation::checkWritable;
 using simulation::Error;
+using simulation::isSamePlace;
 using simulation::writeAtomically;
 
 /// Files of this process can have so many bytes for as long as it lives, as if the disk were full then.
@@ -96,6 +97,39 @@ TEST_F(AtomicFile, FollowsALink)
     writeAtomically(file, "new\n");
     EXPECT_TRUE(std::filesystem::is_symlink(file));
     EXPECT_EQ(folder.read("elsewhere/file.csv"), "new\n");
+}
+
+TEST_F(AtomicFile, FollowsLinksToAFileThatIsNotThereYet)
+{
+    std::filesystem::create_directory(folder.path("elsewhere"));
+    std::filesystem::create_symlink("elsewhere/link.csv", file);
+    std::filesystem::create_symlink("file.csv", folder.path("elsewhere/link.csv"));
+    checkWritable(file);
+    writeAtomically(file, "new\n");
+    EXPECT_TRUE(std::filesystem::is_symlink(file));
+    EXPECT_EQ(folder.read("elsewhere/file.csv"), "new\n");
+}
+
+TEST_F(AtomicFile, IsRefusedWhereALinkLeadsNowhere)
+{
+    std::filesystem::create_symlink("file.csv", file);
+    EXPECT_EQ(refusal(file, ""), file + ": cannot be written: Too many levels of symbolic links");
+    EXPECT_THROW(checkWritable(file), Error);
+    EXPECT_TRUE(std::filesystem::is_symlink(file));
+}
+
+TEST_F(AtomicFile, IsTheSamePlaceUnderAllOfItsNames)
+{
+    std::filesystem::create_symlink("file.csv", folder.path("link.svg"));
+    std::filesystem::create_directory(folder.path("sub"));
+    for (const char* state : {"is not there", "is there"}) {
+        SCOPED_TRACE(state);
+        EXPECT_TRUE(isSamePlace(file, folder.path("link.svg")));
+        EXPECT_TRUE(isSamePlace(file, folder.path("sub/../file.csv")));
+        EXPECT_FALSE(isSamePlace(file, folder.path("other.csv")));
+        EXPECT_FALSE(isSamePlace(file, folder.path("sub/file.csv")));
+        folder.write("file.csv", "");
+    }
 }
 
 TEST_F(AtomicFile, OverwritesWhatAKilledRunHasLeft)
