@@ -57,10 +57,21 @@ void checkInstructionSet(const std::string& name)
     }
 }
 
+/// Throws Error if what is written to the one file, if any, would take the place of the other.
+void checkDistinct(const std::string& file, const std::string& other)
+{
+    if (!file.empty() && !other.empty() && simulation::isSamePlace(file, other)) {
+        throw simulation::Error(file + ": is the same file as " + other + ", each output needs its own");
+    }
+}
+
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
     const Pictures pictures(options.pictures);
+    checkDistinct(options.pictures.plot, options.output);
+    checkDistinct(options.pictures.report, options.output);
+    checkDistinct(options.pictures.report, options.pictures.plot);
     const Interruption interruption;
     std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
@@ -125,8 +136,8 @@ results whatever the number of threads or the machine. docs/error_rates.md tells
 Exit status: 0 all simulated, 2 bad input or usage, 128 and the signal's number when a
 signal ended the run; --resume goes on then, as it does after a crash.
 
-Example: the waterfall of 512 bits for two and eight units
-  morvik ber --block-size 512 --num-pu 2,8 --output k512.csv)";
+Example: the waterfall of 512 bits after four and after eight iterations
+  morvik ber --block-size 512 --iterations 4,8 --output k512.csv)";
 
 }  // namespace
 

@@ -3,8 +3,10 @@
 
 #include <algorithm>
 #include <cmath>
+#include <filesystem>
 #include <locale>
 #include <sstream>
+#include <stdexcept>
 
 #include "PageParts.h"
 #include "Series.h"
@@ -276,6 +278,9 @@ void writeRun(std::ostream& page, const RunDescription& run)
 
 void checkReport(const std::string& fileName)
 {
+    if (std::filesystem::path(fileName).extension() != ".html") {
+        throw std::runtime_error(fileName + ": is no name for a report, allowed are names that end in .html");
+    }
     simulation::checkWritable(fileName);
 }
 

@@ -1,6 +1,7 @@
 // morvik ber: the plot and the report that it leaves.
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <regex>
 #include <string>
 #include <vector>
@@ -74,10 +75,21 @@ TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)
                         "nowhere/curves.svg: cannot be written: No such file or directory");
     expectRefusedAtOnce("--report nowhere/report.html",
                         "nowhere/report.html: cannot be written: No such file or directory");
+    expectRefusedAtOnce("--report results.csv",
+                        "results.csv: is no name for a report, allowed are names that end in .html");
     expectRefusedAtOnce("--reference nothing.csv", "nothing.csv: cannot be opened: No such file or directory");
     morvik.write("bad.csv", "ebn0_db,ber\n0,much\n");
     expectRefusedAtOnce("--reference bad.csv",
                         "bad.csv:2: \"much\" in the column ber is not allowed, allowed are numbers from 0 to 1");
+}
+
+TEST_F(BerPictures, ThatWouldTakeThePlaceOfTheResultsEndTheRunBeforeItBegins)
+{
+    std::filesystem::create_symlink("results.csv", morvik.directory() + "/curves.svg");
+    std::filesystem::create_symlink("curves.svg", morvik.directory() + "/report.html");
+    expectRefusedAtOnce("--plot curves.svg", "curves.svg: is the same file as results.csv, each output needs its own");
+    expectRefusedAtOnce("--report report.html",
+                        "report.html: is the same file as results.csv, each output needs its own");
 }
 
 }  // namespace
