@@ -49,6 +49,16 @@ bool readBlockSize(std::string_view text, ResultRow& row)
     return readNumber(text, row.point.blockSize) && standard::findBlockSize(row.point.blockSize) != nullptr;
 }
 
+bool readNumPu(std::string_view text, ResultRow& row)
+{
+    return readNumber(text, row.point.numPu) && (text == "2" || text == "4" || text == "8");
+}
+
+bool readIterations(std::string_view text, ResultRow& row)
+{
+    return readNumber(text, row.point.iterations) && row.point.iterations >= 1 && row.point.iterations <= 15;
+}
+
 bool readScaleOption(std::string_view text, ResultRow& row)
 {
     row.point.scaleOption = parseThousandths(text);
@@ -105,7 +115,7 @@ const std::vector<Column> allColumns = {
      readBlockSize},
     {"num_pu", number,
      [](const Row& row) { return std::to_string(row.point.numPu); },
-     [](Text field, Row& row) { return readNumber(field, row.point.numPu); }},
+     readNumPu},
     {"algorithm", text,
      [](const Row& row) { return algorithmName(row.point.algorithm); },
      [](Text field, Row& row) { return readInto(algorithmOf(field), row.point.algorithm); }},
@@ -114,7 +124,7 @@ const std::vector<Column> allColumns = {
      readScaleOption},
     {"iterations", number,
      [](const Row& row) { return std::to_string(row.point.iterations); },
-     [](Text field, Row& row) { return readNumber(field, row.point.iterations); }},
+     readIterations},
     {"ebn0_db", number,
      [](const Row& row) { return thousandthsText(row.point.milliDecibels); },
      [](Text field, Row& row) { return readInto(parseThousandths(field), row.point.milliDecibels); }},

@@ -118,6 +118,9 @@ TEST_F(ResultFiles, WithMistakesAreRefusedWithTheirPlaces)
     EXPECT_EQ(refusal("a.csv", "").substr(0, 45), "a.csv:1: no header of a result file, expected");
     EXPECT_EQ(refusal("a.csv", header + "1,2\n"), "a.csv:2: 2 fields, expected 25");
     EXPECT_EQ(refusal("a.csv", csvWith("0,40,4,", "0,41,4,")), "a.csv:2: block_size \"41\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",4,scaled,", ",3,scaled,")), "a.csv:2: num_pu \"3\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",auto,8,", ",auto,0,")), "a.csv:2: iterations \"0\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", csvWith(",auto,8,", ",auto,16,")), "a.csv:2: iterations \"16\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",scaled,", ",sealed,")), "a.csv:2: algorithm \"sealed\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",auto,", ",automatic,")), "a.csv:2: scale_option \"automatic\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",1.25,", ",1.25dB,")), "a.csv:2: ebn0_db \"1.25dB\" is not allowed");
