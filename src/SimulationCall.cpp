@@ -128,9 +128,15 @@ Status countByComponents(State& state,
     });
 }
 
+/// Whether somebody traces or presets values that the lanes do not have.
+bool isWatched(const TDecoder& decoder)
+{
+    return decoder.itsDumpCount != 0 || decoder.itsTraceLevel != 0 || !decoder.itsExtrinsicIn.empty();
+}
+
 bool lanesTake(const State& state, std::int32_t dinSize)
 {
-    return state.lane_path != nullptr && !state.by_components && state.decoder->itsDumpCount == 0 &&
+    return state.lane_path != nullptr && !state.by_components && !isWatched(*state.decoder) &&
            dinSize > std::int32_t{lanes::tailPositions} && state.interleaver->valid(blockSizeOf(dinSize));
 }
 

@@ -278,6 +278,23 @@ TEST(TDecoder3GPU, EndsWithTheRatiosAndExtrinsicValuesOfThePlainFormulation)
     }
 }
 
+// The lanes have neither.
+TEST(TDecoder3GPU, IsPresetAndTracedInAStateOfTheCInterface)
+{
+    blocks::Random random(8);
+    const blocks::Block block = blocks::randomBlock(random, 40, blocks::Values::uniform);
+    blocks::Decoder preset(4, 1);
+    preset.state()->decoder->itsExtrinsicIn.assign(43, -2048);
+    EXPECT_NE(preset.decode(block, 1).bits, blocks::Decoder(4, 1).decode(block, 1).bits);
+    EXPECT_TRUE(preset.state()->decoder->itsExtrinsicIn.empty());
+
+    blocks::Decoder traced(4, 1);
+    traced.state()->decoder->itsTraceLevel = 2;
+    const CapturedStreams streams;
+    EXPECT_EQ(traced.decode(block, 1).bits, blocks::Decoder(4, 1).decode(block, 1).bits);
+    EXPECT_NE(streams.out().find("itsAlphaSegment=[0,40)"), std::string::npos) << streams.out();
+}
+
 TEST(TDecoder3GPU, FailsWhenAKernelFails)
 {
     using Engine = TCalculationEngineModBase;
