@@ -1,0 +1,146 @@
+// Session: a decoder as a simulator's test bench sees it: filled value by value, read bit by bit, its messages queued.
+#include "Session.h"
+
+#include <iostream>
+#include <mutex>
+#include <sstream>
+
+#include "standard/BlockSizes.h"
+
+namespace morvik::simulator {
+
+namespace {
+
+constexpr std::size_t tail = 4;
+constexpr std::size_t mostPositions = standard::blockSizes.back().K + tail;
+
+/// Collects what the library writes while it lives.
+class Listener {
+public:
+    Listener() : itsLock(mutex()), itsOutput(std::cout.rdbuf(&itsText)), itsError(std::cerr.rdbuf(&itsText)) {}
+
+    ~Listener()
+    {
+        std::cout.rdbuf(itsOutput);
+        std::cerr.rdbuf(itsError);
+    }
+
+    Listener(const Listener&) = delete;
+    Listener& operator=(const Listener&) = delete;
+
+    std::string text() const
+    {
+        return itsText.str();
+    }
+
+private:
+    static std::mutex& mutex()
+    {
+        static std::mutex one;
+        return one;
+    }
+
+    std::lock_guard<std::mutex> itsLock;
+    std::stringbuf itsText;
+    std::streambuf* itsOutput;
+    std::streambuf* itsError;
+};
+
+/// What the library does not say: how the caller may have come to a size that no block has.
+std::string sizeHint(std::size_t positions)
+{
+    const std::string count = std::to_string(positions);
+    if (standard::findBlockSize(static_cast<std::uint32_t>(positions)) != nullptr) {
+        return ": " + count + " soft values in each stream, but a block of " + count + " bits has " +
+               std::to_string(positions + tail) + ", the tail included";
+    }
+    return ": " + count + " soft values in each stream are not K + 4 for a block size K of 3GPP TS 36.212";
+}
+
+}  // namespace
+
+Session::Session(int numPu, int algorithm, int tagWidth)
+{
+    for (auto& stream : itsStreams) {
+        stream.resize(mostPositions);
+    }
+    auto generics = veltra_ip_morvik_v1_0_get_default_generics();
+    generics.C_NUM_PU = numPu;
+    generics.C_ALGORITHM_TYPE = algorithm;
+    generics.C_TAG_WIDTH = tagWidth;
+    const Listener listener;
+    itsState = veltra_ip_morvik_v1_0_create_state(generics);
+    queue(listener.text());
+}
+
+Session::~Session()
+{
+    veltra_ip_morvik_v1_0_destroy_state(itsState);
+}
+
+void Session::put(int sys, int par1, int par2) noexcept
+{
+    if (itsPositions < mostPositions) {
+        itsStreams[0][itsPositions] = sys;
+        itsStreams[1][itsPositions] = par1;
+        itsStreams[2][itsPositions] = par2;
+    }
+    ++itsPositions;
+}
+
+int Session::decode(int iterations, std::uint32_t tag)
+{
+    itsBits.clear();
+    int status = 1;
+    if (!open()) {
+        itsMessages.emplace_back("ERROR:binding:The generics of this decoder were refused, so it does not decode");
+    } else if (itsPositions > mostPositions) {
+        itsMessages.push_back("ERROR:binding:Block size not supported" + sizeHint(itsPositions));
+    } else {
+        status = simulate(iterations, tag);
+    }
+    itsPositions = 0;
+    return status;
+}
+
+int Session::simulate(int iterations, std::uint32_t tag)
+{
+    itsBits.resize(mostPositions);
+    veltra_ip_morvik_v1_0_outputs outputs{itsBits.data(), static_cast<std::uint32_t>(itsBits.size()), 0, itsTag};
+    const Listener listener;
+    const int status = veltra_ip_morvik_v1_0_bitacc_simulate(itsState,
+                                                             itsStreams[0].data(),
+                                                             itsStreams[1].data(),
+                                                             itsStreams[2].data(),
+                                                             static_cast<std::int32_t>(itsPositions),
+                                                             static_cast<std::uint32_t>(iterations),
+                                                             tag,
+                                                             &outputs);
+    queue(listener.text());
+    if (status == 2) {
+        itsMessages.back() += sizeHint(itsPositions);
+    }
+    itsBits.resize(outputs.dout_size);
+    itsTag = outputs.tag;
+    return status;
+}
+
+const std::string& Session::nextMessage()
+{
+    itsMessage.clear();
+    if (!itsMessages.empty()) {
+        itsMessage.swap(itsMessages.front());
+        itsMessages.pop_front();
+    }
+    return itsMessage;
+}
+
+void Session::queue(const std::string& lines)
+{
+    std::istringstream text(lines);
+    for (std::string line; std::getline(text, line);) {
+        itsMessages.push_back(line);
+    }
+}
+
+}  // namespace morvik::simulator

@@ -1,0 +1,69 @@
+// Session: a decoder as a simulator's test bench sees it: filled value by value, read bit by bit, its messages queued.
+//
+// The bindings of simulators whose interfaces disagree on arrays are thin over it.
+#ifndef MORVIK_BINDINGS_SIMULATOR_SESSION_H
+#define MORVIK_BINDINGS_SIMULATOR_SESSION_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <deque>
+#include <string>
+#include <vector>
+
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+namespace morvik::simulator {
+
+/// Nothing is written to the standard streams. They are process-wide, so the calls of all sessions take turns.
+class Session {
+public:
+    /// A decoder whose generics are refused is not `open`, and a message tells why.
+    Session(int numPu, int algorithm, int tagWidth);
+    ~Session();
+    Session(const Session&) = delete;
+    Session& operator=(const Session&) = delete;
+
+    bool open() const
+    {
+        return itsState != nullptr;
+    }
+
+    /// Appends a position to the next block.
+    void put(int sys, int par1, int par2) noexcept;
+
+    /// Decodes the positions that were put since the last call, K + 4, and forgets them. Returns the status of the C
+    /// interface, 0 when decoded.
+    int decode(int iterations, std::uint32_t tag);
+
+    /// The decisions of the last decode, none when it was refused.
+    const std::vector<std::uint8_t>& bits() const
+    {
+        return itsBits;
+    }
+
+    std::uint32_t tag() const
+    {
+        return itsTag;
+    }
+
+    /// Takes the oldest line from the queue of messages: "ERROR:..." or "WARNING:...", or an empty text when there is
+    /// none. The text lasts until the next call.
+    const std::string& nextMessage();
+
+private:
+    int simulate(int iterations, std::uint32_t tag);
+    void queue(const std::string& lines);
+
+    veltra_ip_morvik_v1_0_state* itsState = nullptr;
+    std::array<std::vector<std::int32_t>, 3> itsStreams;
+    std::size_t itsPositions = 0;  ///< put, also beyond what the streams hold
+    std::vector<std::uint8_t> itsBits;
+    std::uint32_t itsTag = 0;
+    std::deque<std::string> itsMessages;
+    std::string itsMessage;
+};
+
+}  // namespace morvik::simulator
+
+#endif

@@ -1,0 +1,60 @@
+// dut_stand_in: takes the place of the turbo decoder core in the example. It accepts the K + 4 positions of a block, one
+// with each clock, and then plays recorded decisions, one bit with each clock. +break_block=B +break_bit=I turns bit I
+// of block B over, as a bug would.
+module dut_stand_in (
+    input logic clk,
+    input logic [31:0] K,  // stable from the first clock on
+    input logic din_valid,
+    input logic signed [7:0] sys,
+    input logic signed [7:0] par1,
+    input logic signed [7:0] par2,
+    output logic dout_valid,
+    output logic dout
+);
+    string name;
+    int file, break_block, break_bit;
+    int block = 0, position = 0, playing = -1;
+
+    initial begin
+        dout_valid = 0;
+        if (!$value$plusargs("decisions=%s", name))
+            $fatal(1, "+decisions=FILE is missing");
+        file = $fopen(name, "r");
+        if (file == 0)
+            $fatal(1, "%s cannot be read", name);
+        if (!$value$plusargs("break_block=%d", break_block))
+            break_block = -1;
+        if (!$value$plusargs("break_bit=%d", break_bit))
+            break_bit = 0;
+    end
+
+    // The next character of the file that is a bit.
+    function automatic logic recorded();
+        int code;
+        code = $fgetc(file);
+        while (code != "0" && code != "1") begin
+            if (code < 0)
+                $fatal(1, "%s has no decisions left", name);
+            code = $fgetc(file);
+        end
+        return code == "1";
+    endfunction
+
+    always @(posedge clk) begin
+        dout_valid <= playing >= 0;
+        if (playing >= 0) begin
+            dout <= recorded() ^ (block == break_block && playing == break_bit);
+            playing <= playing + 1 < K ? playing + 1 : -1;
+            if (playing + 1 == K)
+                block <= block + 1;
+        end
+        if (din_valid) begin
+            position <= position + 1 < K + 4 ? position + 1 : 0;
+            if (position + 1 == K + 4)
+                playing <= 0;
+        end
+    end
+
+    // A real core computes with the soft values.
+    wire unused = ^{sys, par1, par2};
+endmodule

@@ -1,0 +1,81 @@
+// morvik_dpi: the C functions that morvik_pkg.sv imports. No exception passes into the simulator.
+#include "morvik_dpi.h"
+
+#include <cstddef>
+#include <exception>
+
+#include "bindings/simulator/Session.h"
+
+namespace {
+
+using morvik::simulator::Session;
+
+Session* sessionOf(void* decoder)
+{
+    return static_cast<Session*>(decoder);
+}
+
+/// Memory is all that can fail in a session.
+constexpr int outOfMemory = 99;
+
+}  // namespace
+
+void* morvik_dpi_create(int num_pu, int algorithm, int tag_width)
+{
+    try {
+        return new Session(num_pu, algorithm, tag_width);
+    } catch (const std::exception&) {
+        return nullptr;
+    }
+}
+
+void morvik_dpi_destroy(void* decoder)
+{
+    delete sessionOf(decoder);
+}
+
+int morvik_dpi_is_open(void* decoder)
+{
+    return decoder != nullptr && sessionOf(decoder)->open() ? 1 : 0;
+}
+
+void morvik_dpi_put(void* decoder, int sys, int par1, int par2)
+{
+    if (decoder != nullptr) {
+        sessionOf(decoder)->put(sys, par1, par2);
+    }
+}
+
+int morvik_dpi_decode(void* decoder, int iterations, unsigned int tag)
+{
+    if (decoder == nullptr) {
+        return 1;
+    }
+    try {
+        return sessionOf(decoder)->decode(iterations, tag);
+    } catch (const std::exception&) {
+        return outOfMemory;
+    }
+}
+
+int morvik_dpi_size(void* decoder)
+{
+    return decoder == nullptr ? 0 : static_cast<int>(sessionOf(decoder)->bits().size());
+}
+
+int morvik_dpi_bit(void* decoder, int position)
+{
+    return position >= 0 && position < morvik_dpi_size(decoder)
+               ? sessionOf(decoder)->bits()[static_cast<std::size_t>(position)]
+               : 0;
+}
+
+unsigned int morvik_dpi_tag(void* decoder)
+{
+    return decoder == nullptr ? 0 : sessionOf(decoder)->tag();
+}
+
+const char* morvik_dpi_message(void* decoder)
+{
+    return decoder == nullptr ? "" : sessionOf(decoder)->nextMessage().c_str();
+}

@@ -1,0 +1,137 @@
+// wrong_use_tb: what test benches do wrong, and what they are told. +report takes the class as it is, whose messages
+// reach the simulator's log; otherwise they are collected and compared.
+module wrong_use_tb;
+    import morvik_pkg::*;
+
+    int failures = 0;
+
+    class silence extends morvik_reporter;
+        virtual function void report_error(string line);
+        endfunction
+
+        virtual function void report_warning(string line);
+        endfunction
+    endclass
+
+    function automatic soft_values_t values(int count, int value = -24);
+        soft_values_t all;
+        all = new[count];
+        for (int i = 0; i < count; i++)
+            all[i] = value;
+        return all;
+    endfunction
+
+    function automatic void expect_that(morvik_decoder model, int status, string message);
+        if (model.status == status && model.message == message && (status == 0) == (model.dout.size() != 0))
+            return;
+        failures++;
+        $display("expected status %0d and '%s'", status, message);
+        $display("got      status %0d and '%s', %0d decisions", model.status, model.message, model.dout.size());
+    endfunction
+
+    // Decodes three streams of given lengths.
+    function automatic void decode(morvik_decoder model, int sys, int par1, int par2, int iterations);
+        int status;
+        status = model.decode(values(sys), values(par1), values(par2), iterations);
+        if (status != model.status)
+            failures++;
+    endfunction
+
+    function automatic void refuse_generics();
+        morvik_decoder model;
+        model = new(3);
+        expect_that(model, 1, "ERROR:decoder:C_NUM_PU must be either 2, 4 or 8");
+        decode(model, 44, 44, 44, 8);
+        expect_that(model, 1, "ERROR:binding:The generics of this decoder were refused, so it does not decode");
+        if (model.is_open())
+            failures++;
+        model.destroy();
+        model = new(2, 3);
+        expect_that(model, 1, "ERROR:decoder:C_ALGORITHM_TYPE must be in range 0 to 2");
+        model.destroy();
+        model = new(2, 1, 33);
+        expect_that(model, 1, "ERROR:decoder:C_TAG_WIDTH must be in range 0 to 32");
+        model.destroy();
+    endfunction
+
+    function automatic void refuse_blocks();
+        morvik_decoder model;
+        model = new(8);
+        decode(model, 40, 40, 40, 8);
+        expect_that(model, 2, {"ERROR:TDecoder3G:Block size not supported: 40 soft values in each stream, but a block ",
+            "of 40 bits has 44, the tail included"});
+        decode(model, 45, 45, 45, 8);
+        expect_that(model, 2, {"ERROR:TDecoder3G:Block size not supported: 45 soft values in each stream are not K + 4 ",
+            "for a block size K of 3GPP TS 36.212"});
+        decode(model, 6149, 6149, 6149, 8);
+        expect_that(model, 1, {"ERROR:binding:Block size not supported: 6149 soft values in each stream are not K + 4 ",
+            "for a block size K of 3GPP TS 36.212"});
+        decode(model, 0, 0, 0, 8);
+        expect_that(model, 1, "ERROR:decoder:din_size must be a positive integer");
+        decode(model, 44, 43, 44, 8);
+        expect_that(model, 1, "ERROR:binding:The streams differ in length: sys has 44 values, par1 43, par2 44");
+        decode(model, 44, 44, 44, 0);
+        expect_that(model, 1, "ERROR:decoder:Number of iterations must be in the range 1 to 15");
+        decode(model, 44, 44, 44, -1);
+        expect_that(model, 1, "ERROR:decoder:Number of iterations must be in the range 1 to 15");
+        decode(model, 44, 44, 44, 8);
+        expect_that(model, 0, "");
+        model.destroy();
+        decode(model, 44, 44, 44, 8);
+        expect_that(model, 1, "ERROR:binding:decode was called after destroy");
+        model.destroy();
+    endfunction
+
+    function automatic void warn();
+        morvik_decoder model;
+        string saturated, truncated;
+        model = new(8);
+        saturated = "WARNING:decoder:RSC2 parity value in position 0 saturated positively, further saturation will not be reported";
+        truncated = "WARNING:decoder:Input block tag has been truncated to 8 bits, further truncation will not be reported";
+        void'(model.decode(values(44), values(44), values(44, 128), 8, 'h123));
+        expect_that(model, 0, {saturated, "\n", truncated});
+        if (model.dout_tag != 'h23 || model.status_text() != "decoded")
+            failures++;
+        model.destroy();
+    endfunction
+
+    // The class as it is.
+    function automatic void report();
+        morvik_decoder model;
+        model = new(3);
+        decode(model, 44, 44, 44, 8);
+        model.destroy();
+        model = new(2);
+        void'(model.decode(values(44, 200), values(44), values(44), 8));
+        decode(model, 40, 40, 40, 8);
+        model.destroy();
+        decode(model, 44, 44, 44, 8);
+    endfunction
+
+    // Null handles at the functions themselves: nothing happens.
+    function automatic void call_with_null();
+        morvik_dpi_put(null, 0, 0, 0);
+        morvik_dpi_destroy(null);
+        if (morvik_dpi_decode(null, 8, 0) != 1 || morvik_dpi_size(null) != 0 || morvik_dpi_bit(null, 0) != 0
+            || morvik_dpi_tag(null) != 0 || morvik_dpi_message(null) != "" || morvik_dpi_is_open(null) != 0)
+            failures++;
+    endfunction
+
+    initial begin
+        if ($test$plusargs("report"))
+            report();
+        else begin
+            silence reporter;
+            reporter = new;
+            morvik_log = reporter;
+            refuse_generics();
+            refuse_blocks();
+            warn();
+            call_with_null();
+        end
+        $display("%0d failures", failures);
+        if (failures != 0)
+            $fatal(1, "wrong use is answered otherwise");
+        $finish;
+    end
+endmodule
