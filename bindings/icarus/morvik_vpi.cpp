@@ -1,0 +1,288 @@
+// morvik_vpi: the model as system functions of Verilog, for simulators with VPI and without DPI. docs/icarus.md
+// explains them.
+//
+//     handle = $morvik_create(num_pu, algorithm, tag_width);                  0 when they are refused
+//     status = $morvik_decode(handle, sys, par1, par2, size, iterations, tag, dout);
+//     tag = $morvik_tag(handle);                                              of the last block
+//     $morvik_destroy(handle);
+#include <vpi_user.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "bindings/simulator/Session.h"
+
+namespace {
+
+using morvik::simulator::Session;
+
+/// A system task or function: its name, and what its arguments are, a letter each: i an integer, a an array of soft
+/// values, d an array of decisions.
+struct Call {
+    const char* name;
+    const char* arguments;
+};
+
+/// What is wrong with the arguments of a call.
+struct Mistake : std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+std::map<int, std::unique_ptr<Session>>& sessions()
+{
+    static std::map<int, std::unique_ptr<Session>> all;
+    return all;
+}
+
+// The interface takes texts that are not constant, and does not change them.
+char* text(const char* constant)
+{
+    return const_cast<char*>(constant);
+}
+
+/// In the form of the simulator's own errors.
+void report(const char* severity, const std::string& line)
+{
+    vpiHandle call = vpi_handle(vpiSysTfCall, nullptr);
+    vpi_printf(text("%s: %s:%d: morvik: %s\n"),
+               severity,
+               vpi_get_str(vpiFile, call),
+               static_cast<int>(vpi_get(vpiLineNo, call)),
+               line.c_str());
+}
+
+void reportMessages(Session& session)
+{
+    for (std::string line = session.nextMessage(); !line.empty(); line = session.nextMessage()) {
+        report(line.rfind("WARNING:", 0) == 0 ? "WARNING" : "ERROR", line);
+    }
+}
+
+std::vector<vpiHandle> argumentsOf(vpiHandle call)
+{
+    std::vector<vpiHandle> all;
+    vpiHandle iterator = vpi_iterate(vpiArgument, call);
+    if (iterator != nullptr) {
+        while (vpiHandle argument = vpi_scan(iterator)) {
+            all.push_back(argument);
+        }
+    }
+    return all;
+}
+
+/// The low 32 bits of a value, extended by its sign where it is narrower and `isSigned`.
+int valueOf(vpiHandle object, bool isSigned, const std::string& name)
+{
+    const int width = vpi_get(vpiSize, object);
+    s_vpi_value value{};
+    value.format = vpiVectorVal;
+    vpi_get_value(object, &value);
+    if (value.value.vector[0].bval != 0) {
+        throw Mistake(name + " has bits that are x or z");
+    }
+    const auto bits = static_cast<std::uint32_t>(value.value.vector[0].aval);
+    const std::uint32_t sign = isSigned && width < 32 ? std::uint32_t{1} << (width - 1) : 0;
+    return static_cast<std::int32_t>((bits ^ sign) - sign);
+}
+
+int argument(vpiHandle object, const std::string& name)
+{
+    return valueOf(object, vpi_get(vpiSigned, object) != 0, name);
+}
+
+void setValue(vpiHandle object, int integer)
+{
+    s_vpi_value value{};
+    value.format = vpiIntVal;
+    value.value.integer = integer;
+    vpi_put_value(object, &value, nullptr, vpiNoDelay);
+}
+
+Session& sessionOf(vpiHandle object)
+{
+    const int handle = argument(object, "The handle");
+    const auto place = sessions().find(handle);
+    if (place == sessions().end()) {
+        throw Mistake(std::to_string(handle) + " is no decoder: it was not created, or was destroyed");
+    }
+    return *place->second;
+}
+
+/// The first element of an array that has at least `count`.
+int firstIndex(vpiHandle array, int count)
+{
+    const int words = vpi_get(vpiSize, array);
+    if (words < count) {
+        throw Mistake(std::string(vpi_get_str(vpiName, array)) + " has " + std::to_string(words) +
+                      " elements, but this call needs " + std::to_string(count));
+    }
+    s_vpi_value left{};
+    left.format = vpiIntVal;
+    vpi_get_value(vpi_handle(vpiLeftRange, array), &left);
+    s_vpi_value right{};
+    right.format = vpiIntVal;
+    vpi_get_value(vpi_handle(vpiRightRange, array), &right);
+    return left.value.integer < right.value.integer ? left.value.integer : right.value.integer;
+}
+
+/// A soft value. The simulator does not tell whether an array is signed; soft values always are.
+int element(vpiHandle array, int index)
+{
+    return valueOf(vpi_handle_by_index(array, index),
+                   true,
+                   std::string(vpi_get_str(vpiName, array)) + "[" + std::to_string(index) + "]");
+}
+
+// ---- The calls
+
+int create(const std::vector<vpiHandle>& arguments)
+{
+    static int last = 0;
+    auto session = std::make_unique<Session>(
+        argument(arguments[0], "num_pu"), argument(arguments[1], "algorithm"), argument(arguments[2], "tag_width"));
+    reportMessages(*session);
+    if (!session->open()) {
+        return 0;
+    }
+    sessions()[++last] = std::move(session);
+    return last;
+}
+
+void putStreams(Session& session, const std::vector<vpiHandle>& streams, int size)
+{
+    int first[3] = {};
+    for (std::size_t s = 0; s < 3; ++s) {
+        first[s] = firstIndex(streams[s], size);
+    }
+    std::vector<int> values;
+    for (int i = 0; i < size; ++i) {
+        for (std::size_t s = 0; s < 3; ++s) {
+            values.push_back(element(streams[s], first[s] + i));
+        }
+    }
+    for (std::size_t i = 0; i < values.size(); i += 3) {
+        session.put(values[i], values[i + 1], values[i + 2]);
+    }
+}
+
+int decode(const std::vector<vpiHandle>& arguments)
+{
+    Session& session = sessionOf(arguments[0]);
+    const int size = argument(arguments[4], "The size");
+    const int firstDecision = firstIndex(arguments[7], size > 4 ? size - 4 : 0);
+    putStreams(session, {arguments[1], arguments[2], arguments[3]}, size);
+    const int status = session.decode(argument(arguments[5], "iterations"),
+                                      static_cast<std::uint32_t>(argument(arguments[6], "The tag")));
+    reportMessages(session);
+    for (std::size_t i = 0; i < session.bits().size(); ++i) {
+        setValue(vpi_handle_by_index(arguments[7], firstDecision + static_cast<int>(i)), session.bits()[i]);
+    }
+    return status;
+}
+
+int tag(const std::vector<vpiHandle>& arguments)
+{
+    return static_cast<int>(sessionOf(arguments[0]).tag());
+}
+
+int destroy(const std::vector<vpiHandle>& arguments)
+{
+    sessionOf(arguments[0]);
+    sessions().erase(argument(arguments[0], "The handle"));
+    return 0;
+}
+
+// ---- What the simulator sees
+
+constexpr Call createCall{"$morvik_create", "iii"};
+constexpr Call decodeCall{"$morvik_decode", "iaaaiiid"};
+constexpr Call tagCall{"$morvik_tag", "i"};
+constexpr Call destroyCall{"$morvik_destroy", "i"};
+
+bool isArray(vpiHandle object)
+{
+    const int type = vpi_get(vpiType, object);
+    return type == vpiMemory || type == vpiNetArray;
+}
+
+void checkArgument(vpiHandle object, char kind, std::size_t number)
+{
+    const std::string name = "argument " + std::to_string(number);
+    if (isArray(object) != (kind != 'i')) {
+        throw Mistake(name + (kind == 'i' ? " is an array, but must be a value" : " must be an array"));
+    }
+    if (kind == 'a' && vpi_get(vpiSize, vpi_handle_by_index(object, firstIndex(object, 1))) > 32) {
+        throw Mistake(name + ", " + vpi_get_str(vpiName, object) + ", must be an array of at most 32 bits each");
+    }
+}
+
+/// When the design is compiled: the number and the kinds of the arguments.
+PLI_INT32 check(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): the interface's type
+{
+    const auto& call = *reinterpret_cast<const Call*>(data);
+    const std::string kinds = call.arguments;
+    try {
+        const auto arguments = argumentsOf(vpi_handle(vpiSysTfCall, nullptr));
+        if (arguments.size() != kinds.size()) {
+            throw Mistake("takes " + std::to_string(kinds.size()) + " arguments, not " +
+                          std::to_string(arguments.size()));
+        }
+        for (std::size_t i = 0; i < kinds.size(); ++i) {
+            checkArgument(arguments[i], kinds[i], i + 1);
+        }
+    } catch (const std::exception& error) {
+        report("ERROR", std::string(call.name) + ": " + error.what());
+        vpip_set_return_value(1);
+        vpi_control(vpiFinish, 1);
+    }
+    return 0;
+}
+
+/// Calls a function with its arguments; a mistake becomes a line in the log, and `failed`.
+template <int (*function)(const std::vector<vpiHandle>&), int failed, bool returns>
+PLI_INT32 run(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): the interface's type
+{
+    vpiHandle call = vpi_handle(vpiSysTfCall, nullptr);
+    int result = failed;
+    try {
+        result = function(argumentsOf(call));
+    } catch (const std::exception& error) {
+        report("ERROR", std::string(reinterpret_cast<const Call*>(data)->name) + ": " + error.what());
+    }
+    if (returns) {
+        setValue(call, result);
+    }
+    return 0;
+}
+
+void announce(const Call& call, PLI_INT32 type, PLI_INT32 (*function)(PLI_BYTE8*))
+{
+    s_vpi_systf_data data{};
+    data.type = type;
+    data.sysfunctype = vpiIntFunc;
+    data.tfname = text(call.name);
+    data.calltf = function;
+    data.compiletf = check;
+    data.user_data = text(reinterpret_cast<const char*>(&call));
+    vpi_register_systf(&data);
+}
+
+void announceAll()
+{
+    announce(createCall, vpiSysFunc, run<create, 0, true>);
+    announce(decodeCall, vpiSysFunc, run<decode, 1, true>);
+    announce(tagCall, vpiSysFunc, run<tag, 0, true>);
+    announce(destroyCall, vpiSysTask, run<destroy, 0, false>);
+}
+
+}  // namespace
+
+extern "C" {
+/// The simulator calls these when it has loaded the module.
+MORVIK_API void (*vlog_startup_routines[])() = {announceAll, nullptr};
+}

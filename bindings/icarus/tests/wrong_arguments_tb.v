@@ -1,0 +1,15 @@
+// wrong_arguments_tb: calls that are refused when the design is loaded.
+module wrong_arguments_tb;
+    integer status;
+    reg [32:0] wide_values [0:43];
+    reg signed [7:0] values [0:43];
+    reg dout [0:39];
+
+    initial begin
+        status = $morvik_create(2, 1);
+        status = $morvik_decode(1, values, values, wide_values, 44, 8, 0, dout);
+        status = $morvik_decode(1, values, status, values, 44, 8, 0, dout);
+        status = $morvik_create(2, values, 8);
+        $display("the simulation has begun");
+    end
+endmodule
