@@ -1,19 +1,7 @@
-// Messages: the standard streams of the library.
+// Messages: how a line is put together and written.
 #include "Messages.h"
 
-#include <iostream>
-
 namespace messages {
-
-std::ostream& output()
-{
-    return std::cout;
-}
-
-std::ostream& error()
-{
-    return std::cerr;
-}
 
 void LineBuffer::add(std::string_view text)
 {

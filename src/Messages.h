@@ -14,10 +14,10 @@
 
 namespace messages {
 
-/// The stream that carries warnings and traces: the process's standard output.
+/// The stream that carries warnings and traces: the process's standard output (MessageStreams.cpp).
 std::ostream& output();
 
-/// The stream that carries errors: the process's standard error.
+/// The stream that carries errors: the process's standard error (MessageStreams.cpp).
 std::ostream& error();
 
 /// The characters of one part of a line: a text, a character, or an integer in decimal.
