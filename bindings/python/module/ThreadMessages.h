@@ -1,0 +1,24 @@
+// ThreadMessages: what the library has to say, kept for the caller instead of written to the process's streams.
+//
+// The module is linked from the library's objects, with this unit in the place of src/MessageStreams.cpp. Each thread
+// has streams of its own, so that a message always belongs to the call that caused it.
+#ifndef MORVIK_PYTHON_THREADMESSAGES_H
+#define MORVIK_PYTHON_THREADMESSAGES_H
+
+#include <string>
+#include <vector>
+
+namespace morvik::python {
+
+/// Messages of one thread, without what the library puts before the text: "ERROR:decoder:".
+struct Messages {
+    std::string error;  ///< the first one, or empty
+    std::vector<std::string> warnings;
+};
+
+/// What has been said in this thread since the last call.
+Messages takeMessages();
+
+}  // namespace morvik::python
+
+#endif

@@ -1,0 +1,311 @@
+// module: the extension `morvik._core`, which the package `morvik` is written on. It trusts the package's checks of
+// numbers and shapes.
+#include <pybind11/functional.h>
+#include <pybind11/numpy.h>
+#include <pybind11/pybind11.h>
+#include <pybind11/stl.h>
+
+#include <cstring>
+#include <optional>
+#include <utility>
+
+#include "Decoder.h"
+#include "ErrorRates.h"
+#include "link/Channel.h"
+#include "link/DefaultScale.h"
+#include "link/TurboEncoder.h"
+#include "simulation/Error.h"
+#include "simulation/Thousandths.h"
+#include "standard/BlockSizes.h"
+
+namespace py = pybind11;
+using namespace morvik::python;
+
+namespace {
+
+template <class Element>
+using Array = py::array_t<Element, py::array::c_style>;
+
+std::size_t sizeOf(py::ssize_t extent)
+{
+    return static_cast<std::size_t>(extent);
+}
+
+// ---- Decoding
+
+/// Returns status, error text, warnings, bits, kept tags, and ratios or None.
+template <class Input>
+py::tuple decode(Decoder& decoder,
+                 const Array<Input>& sys,
+                 const Array<Input>& par1,
+                 const Array<Input>& par2,
+                 std::uint32_t iterations,
+                 const Array<std::uint32_t>& tags,
+                 bool wantsRatios,
+                 unsigned threads)
+{
+    const py::ssize_t blocks = tags.size();
+    const py::ssize_t positions = sys.shape(1);
+    Array<std::uint8_t> bits({blocks, positions - 4});
+    Array<std::uint32_t> keptTags(blocks);
+    std::optional<Array<std::int16_t>> ratios;
+    if (wantsRatios) {
+        ratios.emplace(std::vector{blocks, positions - 4});
+    }
+
+    Batch<Input> batch;
+    batch.streams = {sys.data(), par1.data(), par2.data()};
+    batch.positions = static_cast<std::int32_t>(positions);
+    batch.blocks = static_cast<std::uint32_t>(blocks);
+    batch.iterations = iterations;
+    batch.tags = tags.data();
+    batch.bits = bits.mutable_data();
+    batch.ratios = ratios ? ratios->mutable_data() : nullptr;
+    batch.keptTags = keptTags.mutable_data();
+    Outcome outcome;
+    {
+        const py::gil_scoped_release unlocked;
+        outcome = decoder.decode(batch, threads);
+    }
+    return py::make_tuple(outcome.status, outcome.messages.error, outcome.messages.warnings, bits, keptTags, ratios);
+}
+
+template <class Input>
+void addDecode(py::class_<Decoder>& decoder)
+{
+    decoder.def("decode",
+                decode<Input>,
+                py::arg("sys").noconvert(),
+                py::arg("par1").noconvert(),
+                py::arg("par2").noconvert(),
+                py::arg("iterations"),
+                py::arg("tags").noconvert(),
+                py::arg("wants_ratios"),
+                py::arg("threads"));
+}
+
+void addDecoder(py::module_& module)
+{
+    py::register_exception<Refusal>(module, "Error", PyExc_ValueError);
+    py::class_<Decoder> decoder(module, "Decoder");
+    decoder.def(py::init<std::int32_t, std::int32_t, std::int32_t, std::string>(),
+                py::arg("num_pu"),
+                py::arg("algorithm"),
+                py::arg("tag_width"),
+                py::arg("instruction_set"));
+    addDecode<std::int8_t>(decoder);
+    addDecode<std::int16_t>(decoder);
+    addDecode<std::int32_t>(decoder);
+    // Each of these may have to wait for a thread that decodes.
+    const py::call_guard<py::gil_scoped_release> unlocked;
+    decoder.def("close", &Decoder::close, unlocked);
+    decoder.def_property_readonly("closed", py::cpp_function(&Decoder::isClosed, unlocked));
+    decoder.def_property_readonly("instruction_set", py::cpp_function(&Decoder::instructionSet, unlocked));
+}
+
+// ---- What stands around a decoder
+
+Array<std::int64_t> interleaver(unsigned K)
+{
+    const standard::BlockSize& row = *standard::findBlockSize(K);
+    Array<std::int64_t> positions(static_cast<py::ssize_t>(K));
+    for (std::uint64_t i = 0; i < K; ++i) {
+        positions.mutable_data()[i] = static_cast<std::int64_t>((row.f1 * i + row.f2 * i * i) % K);
+    }
+    return positions;
+}
+
+void pack(const std::uint8_t* bits, std::size_t count, std::uint64_t* words)
+{
+    for (std::size_t k = 0; k < count; ++k) {
+        words[k / 64] |= std::uint64_t{bits[k]} << k % 64;
+    }
+}
+
+void unpack(const std::uint64_t* words, std::size_t count, std::uint8_t* bits)
+{
+    for (std::size_t k = 0; k < count; ++k) {
+        bits[k] = words[k / 64] >> k % 64 & 1;
+    }
+}
+
+/// Encodes blocks of K bits, each 0 or 1, into the three streams of K + 4.
+py::tuple encode(const Array<std::uint8_t>& bits)
+{
+    using morvik::link::TurboEncoder;
+    const std::size_t blocks = sizeOf(bits.shape(0));
+    const std::size_t K = sizeOf(bits.shape(1));
+    std::array<Array<std::uint8_t>, 3> streams;
+    std::array<std::uint8_t*, 3> to{};
+    for (std::size_t s = 0; s < streams.size(); ++s) {
+        streams[s] = Array<std::uint8_t>({bits.shape(0), bits.shape(1) + 4});
+        to[s] = streams[s].mutable_data();
+    }
+    const std::uint8_t* from = bits.data();
+    {
+        const py::gil_scoped_release unlocked;
+        TurboEncoder encoder(static_cast<unsigned>(K));
+        morvik::link::PackedBlocks information{encoder.words(), {}};
+        TurboEncoder::Streams encoded;
+        for (std::size_t done = 0; done < blocks; done += TurboEncoder::blocksAtOnce) {
+            const auto now = static_cast<unsigned>(std::min<std::size_t>(blocks - done, TurboEncoder::blocksAtOnce));
+            information.bits.assign(std::size_t{now} * information.words, 0);
+            for (unsigned b = 0; b < now; ++b) {
+                pack(from + (done + b) * K, K, information.block(b));
+            }
+            encoder.encode(information, now, encoded);
+            for (std::size_t s = 0; s < streams.size(); ++s) {
+                for (unsigned b = 0; b < now; ++b) {
+                    unpack(encoded[s].block(b), K + 4, to[s] + (done + b) * (K + 4));
+                }
+            }
+        }
+    }
+    return py::make_tuple(streams[0], streams[1], streams[2]);
+}
+
+void addLink(py::module_& module)
+{
+    py::tuple sizes(standard::blockSizes.size());
+    for (std::size_t i = 0; i < standard::blockSizes.size(); ++i) {
+        sizes[i] = standard::blockSizes[i].K;
+    }
+    module.attr("block_sizes") = sizes;
+    module.def("interleaver", interleaver, py::arg("block_size"));
+    module.def("encode", encode, py::arg("bits").noconvert());
+    module.def(
+        "noise_deviation",
+        [](unsigned K, int milliDecibels) {
+            return static_cast<double>(morvik::link::noiseDeviation(K, milliDecibels));
+        },
+        py::arg("block_size"),
+        py::arg("milli_decibels"));
+    module.def("default_scale",
+               morvik::link::defaultScale,
+               py::arg("algorithm"),
+               py::arg("block_size"),
+               py::arg("milli_decibels"));
+}
+
+// ---- Simulation
+
+/// Named as the columns of result files.
+py::dict fields(const simulation::ResultRow& row)
+{
+    const simulation::Bounds bits = simulation::bitErrorBounds(row);
+    const simulation::Bounds blocks = simulation::blockErrorBounds(row);
+    py::dict fields;
+    fields["point"] = row.pointNumber;
+    fields["block_size"] = row.point.blockSize;
+    fields["num_pu"] = row.point.numPu;
+    fields["algorithm"] = simulation::algorithmName(row.point.algorithm);
+    fields["scale_option"] = simulation::scaleOptionText(row.point.scaleOption);
+    fields["iterations"] = row.point.iterations;
+    fields["ebn0_db"] = simulation::fromThousandths(row.point.milliDecibels);
+    fields["scale"] = simulation::fromThousandths(row.point.milliScale);
+    fields["frames"] = row.frames.text();
+    fields["blocks"] = row.frames.size();
+    fields["bit_errors"] = row.errors.bitErrors;
+    fields["block_errors"] = row.errors.blockErrors;
+    fields["bit_error_squares"] = row.errors.bitErrorSquares;
+    fields["ber"] = simulation::bitErrorRate(row);
+    fields["ber_low"] = bits.low;
+    fields["ber_high"] = bits.high;
+    fields["bler"] = simulation::blockErrorRate(row);
+    fields["bler_low"] = blocks.low;
+    fields["bler_high"] = blocks.high;
+    fields["clipped_values"] = row.clipped;
+    fields["clipped_fraction"] = simulation::clippedFraction(row);
+    fields["failed_frames"] = py::tuple(py::cast(row.errors.failures));
+    fields["seconds"] = row.seconds;
+    fields["seed"] = row.seed;
+    fields["version"] = row.version;
+    return fields;
+}
+
+py::list fieldsOf(const std::vector<simulation::ResultRow>& rows)
+{
+    py::list list;
+    for (const simulation::ResultRow& row : rows) {
+        list.append(fields(row));
+    }
+    return list;
+}
+
+/// Ctrl-C and the other signals of Python end a simulation by their exceptions.
+Listeners listenersOf(const py::object& progress)
+{
+    Listeners listeners;
+    listeners.isRunning = [] {
+        const py::gil_scoped_acquire locked;
+        if (PyErr_CheckSignals() != 0) {
+            throw py::error_already_set();
+        }
+    };
+    listeners.hasEnded = [&progress](const std::vector<simulation::ResultRow>& rows) {
+        const py::gil_scoped_acquire locked;
+        progress(fieldsOf(rows));
+    };
+    return listeners;
+}
+
+py::list simulate(const simulation::Sweep& sweep,
+                  const simulation::StopRules& rules,
+                  bool eachIteration,
+                  std::uint64_t seed,
+                  unsigned threads,
+                  const std::string& instructionSet,
+                  const py::object& progress)
+{
+    simulation::Plan plan;
+    plan.points = simulation::pointsOf(sweep);
+    plan.eachIteration = eachIteration;
+    plan.rules = rules;
+    plan.seed = seed;
+    plan.version = MORVIK_VERSION;
+    const Listeners listeners = listenersOf(progress);
+    std::vector<simulation::ResultRow> rows;
+    {
+        const py::gil_scoped_release unlocked;
+        rows = errorRates(plan, threads, instructionSet, listeners);
+    }
+    return fieldsOf(rows);
+}
+
+void addSimulation(py::module_& module)
+{
+    py::class_<simulation::Sweep>(module, "Sweep")
+        .def(py::init<>())
+        .def_readwrite("block_sizes", &simulation::Sweep::blockSizes)
+        .def_readwrite("num_pus", &simulation::Sweep::numPus)
+        .def_readwrite("algorithms", &simulation::Sweep::algorithms)
+        .def_readwrite("milli_scales", &simulation::Sweep::scaleOptions)
+        .def_readwrite("iterations", &simulation::Sweep::iterations)
+        .def_readwrite("milli_decibels", &simulation::Sweep::milliDecibels);
+    py::class_<simulation::StopRules>(module, "StopRules")
+        .def(py::init<>())
+        .def_readwrite("block_errors", &simulation::StopRules::blockErrors)
+        .def_readwrite("bit_errors", &simulation::StopRules::bitErrors)
+        .def_readwrite("max_blocks", &simulation::StopRules::maxBlocks)
+        .def_readwrite("max_seconds", &simulation::StopRules::maxSeconds)
+        .def_readwrite("stop_bler", &simulation::StopRules::stopBler);
+    module.def("error_rate",
+               simulate,
+               py::arg("sweep"),
+               py::arg("rules"),
+               py::arg("each_iteration"),
+               py::arg("seed"),
+               py::arg("threads"),
+               py::arg("instruction_set"),
+               py::arg("progress"));
+}
+
+}  // namespace
+
+PYBIND11_MODULE(_core, module)
+{
+    module.attr("__version__") = MORVIK_VERSION;
+    addDecoder(module);
+    addLink(module);
+    addSimulation(module);
+}

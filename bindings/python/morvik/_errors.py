@@ -1,0 +1,12 @@
+"""What goes wrong, as Python sees it."""
+
+from morvik._core import Error as Error
+
+Error.__module__ = "morvik"
+Error.__doc__ = """The decoder refuses something, for the reason that the text gives. A ``ValueError``, too."""
+
+
+class DecoderWarning(UserWarning):
+    """A warning of the decoder, such as of the first soft value that was clipped. Each kind comes once in a
+    decoder's life; ``warnings.filterwarnings("error", category=morvik.DecoderWarning)`` makes it an exception.
+    """
