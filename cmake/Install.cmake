@@ -1,0 +1,52 @@
+# What `cmake --install` puts where: the library with its headers, the CMake package and the pkg-config file by which
+# others find it, and the command. All paths are relative to each other, so an installed tree can be moved. Where the
+# library alone is built, `cmake --install FOLDER --component library` installs all but the command.
+include(GNUInstallDirs)
+include(CMakePackageConfigHelpers)
+set(library morvik_v1_0_bitacc_cmodel)
+set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/${library})
+
+set(CMAKE_INSTALL_DEFAULT_COMPONENT_NAME library)
+set_target_properties(morvik_classes PROPERTIES EXPORT_NAME classes)
+install(TARGETS ${library} morvik_classes EXPORT ${library}
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
+    INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
+
+# The class headers, and those that they need. Their names are common: they keep to a folder of their own.
+set(classes_dir ${CMAKE_INSTALL_INCLUDEDIR}/morvik_v1_0_classes)
+install(FILES
+    src/Arithmetic.h
+    src/Misc.h
+    src/T8.h
+    src/TCalculationEngine.h
+    src/TCalculationEngineMod.h
+    src/TCalculationEngineModBase.h
+    src/TCalculationEngineModHash.h
+    src/TDecoder.h
+    src/TDecoder3G.h
+    src/TDecoder3GPU.h
+    src/TInterleaver.h
+    src/TInterleaver3GPPLTE.h
+    src/TNumberFormat.h
+    DESTINATION ${classes_dir})
+target_include_directories(morvik_classes INTERFACE $<INSTALL_INTERFACE:${classes_dir}>)
+
+set(commands morvik)
+if(TARGET morvik-mpi)
+    list(APPEND commands morvik-mpi)
+endif()
+file(RELATIVE_PATH to_libraries ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LIBDIR})
+set_target_properties(${commands} PROPERTIES INSTALL_RPATH "$ORIGIN/${to_libraries}")
+install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT command)
+
+install(EXPORT ${library} NAMESPACE morvik:: FILE ${library}Config.cmake DESTINATION ${package_dir})
+# A consumer of the other word size is told so, rather than failing in its linker.
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/${library}ConfigVersion.cmake COMPATIBILITY SameMajorVersion)
+install(FILES ${PROJECT_BINARY_DIR}/${library}ConfigVersion.cmake DESTINATION ${package_dir})
+
+cmake_path(RELATIVE_PATH CMAKE_INSTALL_PREFIX BASE_DIRECTORY ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig
+    OUTPUT_VARIABLE pc_to_prefix)
+configure_file(cmake/${library}.pc.in ${PROJECT_BINARY_DIR}/${library}.pc @ONLY)
+install(FILES ${PROJECT_BINARY_DIR}/${library}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
