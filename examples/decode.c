@@ -27,7 +27,10 @@ int main(void)
     unsigned ones = 0;
     for (uint32_t i = 0; i < outputs.dout_size; ++i)
         ones += bits[i];
-    printf("status %d, %u bits, %u of them wrong, tag %u\n", (int)status, (unsigned)outputs.dout_size, ones,
+    printf("status %d, %u bits, %u of them wrong, tag %u\n",
+           (int)status,
+           (unsigned)outputs.dout_size,
+           ones,
            (unsigned)outputs.tag);
 
     /* The tail is missing: a line on the standard error stream says "Block size not supported". */
