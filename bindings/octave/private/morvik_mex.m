@@ -1,0 +1,5 @@
+% MORVIK_MEX  Stands where the compiled function of this name will be.
+function varargout = morvik_mex(varargin)
+    error('morvik:notBuilt', ['these functions are not built: bindings/octave/build builds them into a folder ' ...
+        'for addpath; docs/octave.md tells how, also for MATLAB']);
+end
