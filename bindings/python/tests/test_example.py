@@ -9,7 +9,7 @@ import numpy as np
 
 
 def test_waterfall(repository, tmp_path):
-    script = repository / "bindings/python/examples/waterfall.py"
+    script = repository / "bindings/python/example/waterfall.py"
     run = subprocess.run(
         [sys.executable, script],
         cwd=tmp_path,

@@ -1,6 +1,6 @@
 """A notebook of error rates: run it as a script, or cell by cell in an editor that knows `# %%`.
 
-    PYTHONPATH=build/x86_64/python /usr/bin/python3 bindings/python/examples/waterfall.py
+    bindings/python/run
 
 It takes some seconds, and leaves waterfall.png.
 """
