@@ -80,7 +80,8 @@ package morvik_pkg;
             else if (handle == null)
                 add_message("ERROR:binding:decode was called without a decoder");
             else if (sys.size() != par1.size() || sys.size() != par2.size())
-                add_message($sformatf("ERROR:binding:The streams differ in length: sys has %0d values, par1 %0d, par2 %0d",
+                add_message($sformatf(
+                    "ERROR:binding:The streams differ in length: sys has %0d values, par1 %0d, par2 %0d",
                     sys.size(), par1.size(), par2.size()));
             else
                 result = decode_streams(sys, par1, par2, iterations, tag);
