@@ -9,17 +9,18 @@ namespace morvik {
 
 ReferenceBits::ReferenceBits(std::istream& input, const std::string& name) : itsLines(input, name) {}
 
+std::vector<std::uint8_t> ReferenceBits::next()
+{
+    std::vector<std::uint8_t> bits;
+    for (const char bit : nextLine()) {
+        bits.push_back(bit == '1' ? 1 : 0);
+    }
+    return bits;
+}
+
 std::size_t ReferenceBits::countErrors(const std::vector<std::uint8_t>& decisions)
 {
-    if (!itsLines.next()) {
-        itsLines.fail("no line for block " + std::to_string(itsLines.number()) + ", expected one for each block");
-    }
-    const std::string_view line = itsLines.text();
-    const std::size_t other = line.find_first_not_of("01");
-    if (other != std::string_view::npos) {
-        itsLines.fail("character " + shown(line.substr(other, 1)) + " in column " + std::to_string(other + 1) +
-                      ", allowed are 0 and 1");
-    }
+    const std::string_view line = nextLine();
     if (line.size() != decisions.size()) {
         itsLines.fail(std::to_string(line.size()) + " bits, expected the " + std::to_string(decisions.size()) +
                       " of the block");
@@ -32,6 +33,25 @@ std::size_t ReferenceBits::countErrors(const std::vector<std::uint8_t>& decision
         }
     }
     return errors;
+}
+
+void ReferenceBits::fail(const std::string& what) const
+{
+    itsLines.fail(what);
+}
+
+std::string_view ReferenceBits::nextLine()
+{
+    if (!itsLines.next()) {
+        itsLines.fail("no line for block " + std::to_string(itsLines.number()) + ", expected one for each block");
+    }
+    const std::string_view line = itsLines.text();
+    const std::size_t other = line.find_first_not_of("01");
+    if (other != std::string_view::npos) {
+        itsLines.fail("character " + shown(line.substr(other, 1)) + " in column " + std::to_string(other + 1) +
+                      ", allowed are 0 and 1");
+    }
+    return line;
 }
 
 void ReferenceBits::expectEnd()

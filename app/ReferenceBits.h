@@ -6,17 +6,22 @@
 #include <cstdint>
 #include <istream>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "LineReader.h"
 
 namespace morvik {
 
-/// Compares decisions with the lines, one after the other. What is wrong with a line is thrown as a FileError.
+/// Hands out the lines, or compares decisions with them, one after the other. What is wrong with a line is thrown as a
+/// FileError.
 class ReferenceBits {
 public:
     /// `input` outlives the reader; `name` is what messages call it.
     ReferenceBits(std::istream& input, const std::string& name);
+
+    /// The bits of the next line, 0 or 1 each.
+    std::vector<std::uint8_t> next();
 
     /// The number of decisions that differ from the next line.
     std::size_t countErrors(const std::vector<std::uint8_t>& decisions);
@@ -24,7 +29,12 @@ public:
     /// Throws unless all lines have been compared; blank lines at the end do not count.
     void expectEnd();
 
+    /// Throws a FileError about the line that was read last.
+    [[noreturn]] void fail(const std::string& what) const;
+
 private:
+    std::string_view nextLine();
+
     LineReader itsLines;
 };
 

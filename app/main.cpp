@@ -4,6 +4,7 @@
 #include "Ber.h"
 #include "CommandLine.h"
 #include "Decode.h"
+#include "Doctor.h"
 #include "Merge.h"
 
 int main(int argc, char** argv)
@@ -15,5 +16,5 @@ int main(int argc, char** argv)
     app.require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
     app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
     return morvik::runCommandLine(
-        app, {morvik::addDecode(app), morvik::addBer(app), morvik::addMerge(app)}, argc, argv);
+        app, {morvik::addDecode(app), morvik::addBer(app), morvik::addMerge(app), morvik::addDoctor(app)}, argc, argv);
 }

@@ -1,0 +1,270 @@
+// Diagnosis: why blocks do not decode into the bits that were sent.
+#include "Diagnosis.h"
+
+#include <algorithm>
+#include <cmath>
+#include <tuple>
+
+#include "Trial.h"
+
+namespace morvik::doctor {
+
+namespace {
+
+/// Evidence that a mistake needs, as a logarithm of odds: by itself, e^-12 is a chance in 160 000 for each of the 1728
+/// combinations; and together with blocks that decode once it is undone.
+constexpr double enoughByItself = 12;
+constexpr double enoughWithDecoding = 6;
+/// Standard deviations by which signs have to be better than chance to belong to the bits.
+constexpr double related = 5;
+constexpr std::size_t likelyAttempts = 8;
+constexpr std::uint32_t simulatedBlocks = 400;
+/// Of the simulated blocks: when fewer fail, noise does not explain a failure.
+constexpr double explainedFrom = 0.005;
+
+std::vector<Case> undone(const std::vector<Case>& cases, const Mistakes& mistakes)
+{
+    std::vector<Case> right;
+    right.reserve(cases.size());
+    for (const Case& block : cases) {
+        right.push_back(undone(block, mistakes));
+    }
+    return right;
+}
+
+/// The logarithm of the odds that one wrong sign more is chance, where `fraction` of the signs are wrong anyway.
+double weightOf(const Signs& fewest)
+{
+    const double fraction = std::clamp((fewest.wrong + 1) / (fewest.all + 2), 1e-4, 0.49);
+    return std::log((1 - fraction) / fraction);
+}
+
+/// The odds of belonging to the bits, for numbers of values that differ: values beyond them count as chance.
+double netOdds(const Suspicion& suspicion)
+{
+    return suspicion.signs.odds() - enoughByItself * suspicion.mistakes.count();
+}
+
+/// A stream whose signs chance explains far better than what turns those of the others around.
+std::optional<std::size_t> strangerOf(const Appearance& appearance)
+{
+    for (std::size_t stream = 0; stream < appearance.streams.size(); ++stream) {
+        const Signs others = appearance.others(stream);
+        if (others.certainty() > related && appearance.streams[stream].odds(others.fraction()) < -enoughByItself) {
+            return stream;
+        }
+    }
+    return std::nullopt;
+}
+
+class Examination {
+public:
+    Examination(const std::vector<Case>& cases, const DecoderOptions& options)
+        : itsCases(cases), itsOptions(options), itsTrial(options), itsSuspicions(suspicions(cases))
+    {
+        const auto fewest =
+            std::min_element(itsSuspicions.begin(), itsSuspicions.end(), [](const auto& a, const auto& b) {
+                return a.signs.wrong < b.signs.wrong;
+            });
+        itsWeight = weightOf(fewest->signs);
+        std::sort(itsSuspicions.begin(), itsSuspicions.end(), [this](const auto& a, const auto& b) {
+            return cost(a, enoughByItself) < cost(b, enoughByItself);
+        });
+    }
+
+    Diagnosis run()
+    {
+        Diagnosis diagnosis;
+        diagnosis.blocks = itsCases.size();
+        attemptAll(diagnosis);
+        const Attempt asIs = diagnosis.attempts.front();
+        diagnosis.best = choose(diagnosis.attempts);
+        if (diagnosis.best.decoded == 0) {
+            trySmallerSizes(diagnosis);
+        }
+        tryScale(diagnosis);
+        diagnosis.appearance = appearanceOf(undone(itsCases, diagnosis.best.mistakes));
+        diagnosis.stranger = strangerOf(diagnosis.appearance);
+        diagnosis.clipped = clippedValues();
+        judge(asIs, diagnosis);
+        return diagnosis;
+    }
+
+private:
+    /// The less the likelier.
+    double cost(const Suspicion& suspicion, double eachMistake) const
+    {
+        return itsWeight * suspicion.signs.wrong + eachMistake * suspicion.mistakes.count();
+    }
+
+    double cost(const Attempt& attempt, double eachMistake) const
+    {
+        return cost(Suspicion{attempt.mistakes, attempt.signs}, eachMistake);
+    }
+
+    Attempt attempt(const Suspicion& suspicion)
+    {
+        const Trial::Result result = itsTrial.decode(undone(itsCases, suspicion.mistakes));
+        return {suspicion.mistakes, suspicion.signs, true, result.decoded, result.wrongBits};
+    }
+
+    bool areRowsRight() const
+    {
+        return std::all_of(itsCases.begin(), itsCases.end(), [](const Case& block) {
+            return block.received.size() == block.sent.size() + 4;
+        });
+    }
+
+    void attemptAll(Diagnosis& diagnosis)
+    {
+        std::size_t likely = 0;
+        for (const Suspicion& suspicion : itsSuspicions) {
+            if (suspicion.mistakes.count() <= 1 || likely < likelyAttempts) {
+                diagnosis.attempts.push_back(attempt(suspicion));
+                ++likely;
+            }
+        }
+        Attempt asIs;
+        const auto found = std::find_if(diagnosis.attempts.begin(), diagnosis.attempts.end(), [](const Attempt& each) {
+            return each.mistakes.count() == 0;
+        });
+        if (found != diagnosis.attempts.end()) {
+            std::rotate(diagnosis.attempts.begin(), found, found + 1);
+        } else {
+            asIs.decodable = areRowsRight();
+            diagnosis.attempts.insert(diagnosis.attempts.begin(), asIs);
+        }
+    }
+
+    /// The likeliest attempt by the signs, or one that decodes more blocks and is backed by the signs as well.
+    Attempt choose(const std::vector<Attempt>& attempts) const
+    {
+        Attempt likeliest;
+        double least = HUGE_VAL;
+        for (const Attempt& each : attempts) {
+            if (each.decodable && cost(each, enoughByItself) < least) {
+                least = cost(each, enoughByItself);
+                likeliest = each;
+            }
+        }
+        const auto order = [this](const Attempt& one) {
+            return std::make_tuple(-static_cast<double>(one.decoded), cost(one, enoughWithDecoding));
+        };
+        Attempt best = likeliest;
+        for (const Attempt& each : attempts) {
+            const bool isBacked =
+                each.mistakes.count() == 0 || cost(each, enoughWithDecoding) < cost(likeliest, enoughWithDecoding);
+            if (each.decodable && isBacked && each.decoded > likeliest.decoded && order(each) < order(best)) {
+                best = each;
+            }
+        }
+        return best;
+    }
+
+    /// A block that was padded at its end, as was its reference.
+    void trySmallerSizes(Diagnosis& diagnosis)
+    {
+        const std::size_t K = itsCases.front().sent.size();
+        const bool isOneSize =
+            std::all_of(itsCases.begin(), itsCases.end(), [K](const Case& block) { return block.sent.size() == K; });
+        if (!isOneSize || !areRowsRight()) {
+            return;
+        }
+        std::vector<Suspicion> found = suspicionsOfSmallerSizes(itsCases);
+        std::sort(found.begin(), found.end(), [](const auto& a, const auto& b) { return netOdds(a) > netOdds(b); });
+        found.resize(std::min(found.size(), likelyAttempts));
+        for (const Suspicion& suspicion : found) {
+            const bool isLikelier = netOdds(suspicion) > netOdds({diagnosis.best.mistakes, diagnosis.best.signs});
+            const Attempt tried = attempt(suspicion);
+            diagnosis.attempts.push_back(tried);
+            if (isLikelier && tried.decoded > diagnosis.best.decoded) {
+                diagnosis.best = tried;
+            }
+        }
+    }
+
+    /// A scale that is a power of two away from the one that suits. It is a mistake where it keeps blocks from
+    /// decoding.
+    void tryScale(Diagnosis& diagnosis)
+    {
+        const Appearance appearance = appearanceOf(undone(itsCases, diagnosis.best.mistakes));
+        const double variance = appearance.power - appearance.amplitude * appearance.amplitude;
+        if (appearance.all().certainty() < related || appearance.amplitude <= 0) {
+            return;
+        }
+        // Types 0 and 1 do well with any amplitude around 8 steps; type 2 needs 8 / variance for amplitude 1.
+        const bool isExact = itsOptions.generics.C_ALGORITHM_TYPE == 2 && variance > 0;
+        const double suitable = isExact ? 8 * appearance.amplitude * appearance.amplitude / variance : 8;
+        const int doublings = static_cast<int>(std::lround(std::log2(appearance.amplitude / suitable)));
+        if (doublings == 0) {
+            return;
+        }
+        Suspicion suspicion{diagnosis.best.mistakes, diagnosis.best.signs};
+        suspicion.mistakes.doublings = doublings;
+        const Attempt tried = attempt(suspicion);
+        diagnosis.attempts.push_back(tried);
+        if (tried.decoded > diagnosis.best.decoded) {
+            diagnosis.best = tried;
+        }
+    }
+
+    std::uint64_t clippedValues() const
+    {
+        std::uint64_t count = 0;
+        for (const Case& block : itsCases) {
+            for (const auto* stream : {&block.received.rsc1Sys, &block.received.rsc1Par, &block.received.rsc2Par}) {
+                count += static_cast<std::uint64_t>(std::count_if(
+                    stream->begin(), stream->end(), [](std::int32_t value) { return value < -128 || value > 127; }));
+            }
+        }
+        return count;
+    }
+
+    void judge(const Attempt& asIs, Diagnosis& diagnosis)
+    {
+        const bool isMistaken = diagnosis.best.mistakes.count() > 0;
+        if (asIs.decoded == diagnosis.blocks) {
+            diagnosis.verdict = isMistaken ? Verdict::careless : Verdict::healthy;
+        } else if (diagnosis.best.decoded == diagnosis.blocks) {
+            diagnosis.verdict = Verdict::mistaken;
+        } else if (diagnosis.appearance.all().certainty() < related) {
+            diagnosis.verdict = Verdict::unrelated;
+        } else if (diagnosis.stranger) {
+            diagnosis.verdict = Verdict::strange;
+        } else {
+            diagnosis.noise = noiseOf(diagnosis);
+            const bool isExplained = diagnosis.noise->failed >= explainedFrom * diagnosis.noise->simulated;
+            diagnosis.verdict = isExplained ? Verdict::noisy : Verdict::unexplained;
+        }
+    }
+
+    /// By amplitude and variance; the tail counts as in `morvik ber`.
+    Noise noiseOf(const Diagnosis& diagnosis)
+    {
+        Noise noise;
+        noise.blockSize = itsTrial.decode(undone(itsCases, diagnosis.best.mistakes)).failedSize;
+        const auto K = static_cast<double>(noise.blockSize);
+        const double amplitude = std::max(diagnosis.appearance.amplitude, 1e-3);
+        const double variance = std::max(diagnosis.appearance.power - amplitude * amplitude, 1e-3);
+        noise.ebn0 = 10 * std::log10((3 * K + 12) / (2 * K) * amplitude * amplitude / variance);
+        noise.simulated = simulatedBlocks;
+        noise.failed = simulatedFailures(
+            itsOptions, static_cast<unsigned>(noise.blockSize), noise.ebn0, amplitude, simulatedBlocks);
+        return noise;
+    }
+
+    const std::vector<Case>& itsCases;
+    const DecoderOptions& itsOptions;
+    Trial itsTrial;
+    std::vector<Suspicion> itsSuspicions;
+    double itsWeight = 1;
+};
+
+}  // namespace
+
+Diagnosis diagnose(const std::vector<Case>& cases, const DecoderOptions& options)
+{
+    return Examination(cases, options).run();
+}
+
+}  // namespace morvik::doctor

@@ -1,0 +1,283 @@
+// Mistakes: what goes wrong on the way of soft values from an encoder to a file, and how it is undone.
+#include "Mistakes.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+
+namespace morvik::doctor {
+
+namespace {
+
+using Stream = std::vector<std::int32_t>;
+
+constexpr std::size_t tailRows = 4;
+constexpr const char* columnNames[] = {"rsc1_sys", "rsc1_par", "rsc2_par"};
+
+std::array<Stream*, 3> streamsOf(SoftBlock& block)
+{
+    return {&block.rsc1Sys, &block.rsc1Par, &block.rsc2Par};
+}
+
+/// The streams' `size` rows from `first` on, zeros for those that are not there.
+SoftBlock rowsOf(SoftBlock block, std::size_t first, std::size_t size)
+{
+    for (Stream* stream : streamsOf(block)) {
+        stream->erase(stream->begin(), stream->begin() + static_cast<std::ptrdiff_t>(first));
+        stream->resize(size);
+    }
+    return block;
+}
+
+/// Reverses the bits of each byte; what is left of a byte at the end is reversed by itself.
+void reverseBytes(std::vector<std::uint8_t>& bits)
+{
+    for (std::size_t first = 0; first < bits.size(); first += 8) {
+        const std::size_t end = std::min(first + 8, bits.size());
+        std::reverse(bits.begin() + static_cast<std::ptrdiff_t>(first),
+                     bits.begin() + static_cast<std::ptrdiff_t>(end));
+    }
+}
+
+void restoreTail(SoftBlock& block, const std::array<std::uint8_t, 12>& contents)
+{
+    const std::size_t K = block.size() - tailRows;
+    const auto streams = streamsOf(block);
+    std::array<std::int32_t, 12> values{};
+    for (std::size_t place = 0; place < contents.size(); ++place) {
+        values[contents[place]] = (*streams[place % 3])[K + place / 3];
+    }
+    for (std::size_t place = 0; place < contents.size(); ++place) {
+        (*streams[place % 3])[K + place / 3] = values[place];
+    }
+}
+
+/// Divides by 2^doublings and rounds; the result is clipped as the decoder clips.
+std::int32_t scaled(std::int32_t value, int doublings)
+{
+    return static_cast<std::int32_t>(std::clamp(std::nearbyint(std::ldexp(value, -doublings)), -128.0, 127.0));
+}
+
+std::string namesOf(unsigned columns)
+{
+    std::string names;
+    for (unsigned column = 0; column < 3; ++column) {
+        if ((columns >> column & 1) != 0) {
+            names += (names.empty() ? "" : " and ") + std::string(columnNames[column]);
+        }
+    }
+    return names;
+}
+
+Explanation explain(Rows rows, std::size_t smallerSize)
+{
+    switch (rows) {
+    case Rows::right:
+        break;
+    case Rows::tailMissing:
+        return {"tail_missing",
+                "the tail is missing: a block of K bits has K + 4 rows",
+                "Write the twelve tail values into four more rows; all zeros, if they are not known."};
+    case Rows::first:
+        return {"rows_behind", "rows follow behind the block", "Write the first K + 4 rows alone."};
+    case Rows::last:
+        return {"rows_before", "rows stand before the block", "Write the last K + 4 rows alone."};
+    case Rows::ends:
+        return {"rows_between",
+                "rows stand between data and tail",
+                "Write the first K rows and the last four, without those between."};
+    case Rows::smaller:
+        break;
+    }
+    const std::string K = std::to_string(smallerSize);
+    return {"size",
+            "the block is one of " + K + " bits, padded to more",
+            "Write " + std::to_string(smallerSize + tailRows) + " rows, and a reference of " + K + " bits."};
+}
+
+Explanation explain(Order order)
+{
+    switch (order) {
+    case Order::right:
+    case Order::rowsReversed:
+        break;
+    case Order::dataReversed:
+        return {"data_reversed",
+                "the rows of the data are in reversed order, those of the tail are not",
+                "Write the row of the bit that was encoded first as the first one."};
+    case Order::sentReversed:
+        return {"reference_reversed",
+                "the reference has the bits in reversed order",
+                "Encode and compare in one order: turn each line of the reference around, if the encoder is right."};
+    case Order::sentByteReversed:
+        return {"reference_bytes_reversed",
+                "the reference has the bits of each byte in reversed order",
+                "Unpack bytes in the order in which the encoder takes their bits (3GPP: most significant bit first)."};
+    case Order::sentInverted:
+        return {"reference_inverted", "the reference has 0 for 1 and 1 for 0", "Exchange 0 and 1 in the reference."};
+    }
+    return {"rows_reversed", "the rows are in reversed order, tail first", "Write the last row first."};
+}
+
+Explanation explainColumns(const std::array<std::uint8_t, 3>& contents)
+{
+    std::string found;
+    std::string unmoved;
+    for (std::size_t column = 0; column < 3; ++column) {
+        found += (column == 0 ? "" : ", ") + std::string(columnNames[contents[column]]);
+        unmoved = contents[column] == column ? columnNames[column] : unmoved;
+    }
+    if (unmoved.empty()) {
+        return {"columns", "the columns are " + found, "Write the columns as the header names them."};
+    }
+    std::string swapped;
+    for (std::size_t column = 0; column < 3; ++column) {
+        if (contents[column] != column) {
+            swapped += (swapped.empty() ? "" : " and ") + std::string(columnNames[column]);
+        }
+    }
+    return {"columns", swapped + " are swapped", "Swap the columns " + swapped + '.'};
+}
+
+Explanation explainTail(std::size_t tail)
+{
+    const char* const layouts[] = {"",
+                                   "the tail continues each stream: x z z' of each step, then x' x' x'",
+                                   "the tail is written column by column",
+                                   "the tail is written as x x x z z z, row by row",
+                                   "the tail is written as x x x z z z, column by column",
+                                   "the tail has the second encoder's values first"};
+    return {"tail",
+            layouts[tail],
+            "Write the last four rows as x z x | z x z | x' z' x' | z' x' z' (3GPP TS 36.212, clause 5.1.3.2.2)."};
+}
+
+Explanation explainScale(int doublings)
+{
+    const std::string factor = std::to_string(1LL << std::abs(doublings));
+    if (doublings < 0) {
+        return {"scale",
+                "the scale is missing or too small: values are about " + factor + " times too small",
+                "Multiply by " + factor + " before rounding: an amplitude of 8 suits, in steps of the file."};
+    }
+    return {"scale",
+            "the scale is doubled or too large: values are about " + factor + " times too large",
+            "Divide by " + factor + ": an amplitude of 8 suits, in steps of the file."};
+}
+
+}  // namespace
+
+unsigned Mistakes::count() const
+{
+    unsigned count = 0;
+    for (const bool made :
+         {rows != Rows::right, order != Order::right, columns != 0, flipped != 0, tail != 0, doublings != 0}) {
+        count += made ? 1 : 0;
+    }
+    return count;
+}
+
+std::vector<Explanation> explain(const Mistakes& mistakes)
+{
+    std::vector<Explanation> all;
+    if (mistakes.rows != Rows::right) {
+        all.push_back(explain(mistakes.rows, mistakes.smallerSize));
+    }
+    if (mistakes.order != Order::right) {
+        all.push_back(explain(mistakes.order));
+    }
+    if (mistakes.columns != 0) {
+        all.push_back(explainColumns(columnContents[mistakes.columns]));
+    }
+    if (mistakes.flipped == 7) {
+        all.push_back({"sign",
+                       "the sign of all soft values is flipped",
+                       "Negate all three columns: a positive value favours bit 1."});
+    } else if (mistakes.flipped != 0) {
+        const std::string names = namesOf(mistakes.flipped);
+        all.push_back({"sign",
+                       "the sign of " + names + " is flipped",
+                       "Negate " + names + ": a positive value favours bit 1 in every column."});
+    }
+    if (mistakes.tail != 0) {
+        all.push_back(explainTail(mistakes.tail));
+    }
+    if (mistakes.doublings != 0) {
+        all.push_back(explainScale(mistakes.doublings));
+    }
+    return all;
+}
+
+Case cut(const Case& block, const Mistakes& mistakes)
+{
+    const std::size_t K = mistakes.rows == Rows::smaller ? mistakes.smallerSize : block.sent.size();
+    const std::size_t rows = block.received.size();
+    Case cut = block;
+    if (mistakes.rows == Rows::right || rows == K + tailRows) {
+        return cut;
+    }
+    cut.sent.resize(K);
+    if (mistakes.rows == Rows::tailMissing) {
+        cut.received = rowsOf(rowsOf(cut.received, 0, K), 0, K + tailRows);
+        return cut;
+    }
+    cut.received = rowsOf(cut.received, mistakes.rows == Rows::last ? rows - K - tailRows : 0, K + tailRows);
+    if (mistakes.rows == Rows::ends) {
+        SoftBlock tail = rowsOf(block.received, rows - tailRows, tailRows);
+        const auto from = streamsOf(tail);
+        const auto to = streamsOf(cut.received);
+        for (std::size_t column = 0; column < 3; ++column) {
+            std::copy(from[column]->begin(), from[column]->end(), to[column]->end() - tailRows);
+        }
+    }
+    return cut;
+}
+
+void restoreOrder(Case& block, Order order)
+{
+    switch (order) {
+    case Order::right:
+        break;
+    case Order::rowsReversed:
+    case Order::dataReversed:
+        for (Stream* stream : streamsOf(block.received)) {
+            std::reverse(stream->begin(), stream->end() - (order == Order::dataReversed ? tailRows : 0));
+        }
+        break;
+    case Order::sentReversed:
+        std::reverse(block.sent.begin(), block.sent.end());
+        break;
+    case Order::sentByteReversed:
+        reverseBytes(block.sent);
+        break;
+    case Order::sentInverted:
+        for (std::uint8_t& bit : block.sent) {
+            bit ^= 1;
+        }
+        break;
+    }
+}
+
+Case undone(const Case& block, const Mistakes& mistakes)
+{
+    Case right = cut(block, mistakes);
+    restoreOrder(right, mistakes.order);
+    const auto columns = streamsOf(right.received);
+    for (unsigned column = 0; column < 3; ++column) {
+        const bool flipped = (mistakes.flipped >> column & 1) != 0;
+        for (std::int32_t& value : *columns[column]) {
+            const std::int32_t positive =
+                flipped ? static_cast<std::int32_t>(0U - static_cast<std::uint32_t>(value)) : value;
+            value = mistakes.doublings == 0 ? positive : scaled(positive, mistakes.doublings);
+        }
+    }
+    const SoftBlock found = right.received;
+    const std::array<const Stream*, 3> from{&found.rsc1Sys, &found.rsc1Par, &found.rsc2Par};
+    for (std::size_t column = 0; column < 3; ++column) {
+        *columns[columnContents[mistakes.columns][column]] = *from[column];
+    }
+    restoreTail(right.received, tailContents[mistakes.tail]);
+    return right;
+}
+
+}  // namespace morvik::doctor
