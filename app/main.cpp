@@ -6,6 +6,7 @@
 #include "Decode.h"
 #include "Doctor.h"
 #include "Merge.h"
+#include "SelfTest.h"
 
 int main(int argc, char** argv)
 {
@@ -15,6 +16,12 @@ int main(int argc, char** argv)
     app.set_version_flag("--version", "morvik " MORVIK_VERSION, "Print the version and exit");
     app.require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
     app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
-    return morvik::runCommandLine(
-        app, {morvik::addDecode(app), morvik::addBer(app), morvik::addMerge(app), morvik::addDoctor(app)}, argc, argv);
+    return morvik::runCommandLine(app,
+                                  {morvik::addDecode(app),
+                                   morvik::addBer(app),
+                                   morvik::addMerge(app),
+                                   morvik::addDoctor(app),
+                                   morvik::addSelfTest(app)},
+                                  argc,
+                                  argv);
 }

@@ -1,0 +1,121 @@
+// SelfTest: the subcommand that proves that library and processor give the promised bits.
+#include "SelfTest.h"
+
+#include <cstdio>
+#include <iostream>
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <string>
+
+#include "Files.h"
+#include "SelfCheck.h"
+#include "simulation/Point.h"
+
+namespace morvik {
+
+namespace {
+
+using namespace selftest;
+
+struct Options {
+    bool json = false;
+};
+
+std::string textOf(const Outcome& outcome)
+{
+    const std::size_t all = promise.configurations.size();
+    char line[120];
+    if (!outcome.available) {
+        std::snprintf(line, sizeof line, "  %-10s  not on this machine\n", outcome.instructionSet.c_str());
+        return line;
+    }
+    std::snprintf(line,
+                  sizeof line,
+                  "  %-10s  %s  %zu of %zu configurations  %6.2f s\n",
+                  outcome.instructionSet.c_str(),
+                  outcome.differences.empty() ? "right" : "WRONG",
+                  all - outcome.differences.size(),
+                  all,
+                  outcome.seconds);
+    std::string text = line;
+    for (const Difference& each : outcome.differences) {
+        text += "    " + std::to_string(each.numPu) + " units, " +
+                simulation::algorithmName(static_cast<unsigned>(each.algorithm)) + ": digest " +
+                hexadecimal(each.found) + ", expected " + hexadecimal(each.expected) + '\n';
+    }
+    return text;
+}
+
+std::string textOf(const Findings& findings)
+{
+    std::string text = std::to_string(findings.blocks) + " blocks of " + std::to_string(findings.bits) +
+                       " bits, all 188 sizes: " + (findings.blocksRight ? "right" : "WRONG") + " (digest " +
+                       hexadecimal(findings.blockDigest) + ")\nIn use: " + findings.inUse + '\n';
+    for (const Outcome& outcome : findings.outcomes) {
+        text += textOf(outcome);
+    }
+    return text + (findings.right() ? "Passed: this machine gives the promised bits.\n"
+                                    : "FAILED: this machine does not give the promised bits.\n");
+}
+
+nlohmann::ordered_json jsonOf(const Outcome& outcome)
+{
+    nlohmann::ordered_json differences = nlohmann::ordered_json::array();
+    for (const Difference& each : outcome.differences) {
+        differences.push_back({{"num_pu", each.numPu},
+                               {"algorithm", simulation::algorithmName(static_cast<unsigned>(each.algorithm))},
+                               {"expected", hexadecimal(each.expected)},
+                               {"found", hexadecimal(each.found)}});
+    }
+    return {{"instruction_set", outcome.instructionSet},
+            {"available", outcome.available},
+            {"differences", differences},
+            {"seconds", outcome.seconds}};
+}
+
+std::string jsonOf(const Findings& findings)
+{
+    nlohmann::ordered_json object = {{"version", MORVIK_VERSION},
+                                     {"passed", findings.right()},
+                                     {"in_use", findings.inUse},
+                                     {"blocks", findings.blocks},
+                                     {"bits", findings.bits},
+                                     {"block_digest", hexadecimal(findings.blockDigest)},
+                                     {"blocks_right", findings.blocksRight},
+                                     {"instruction_sets", nlohmann::ordered_json::array()}};
+    for (const Outcome& outcome : findings.outcomes) {
+        object["instruction_sets"].push_back(jsonOf(outcome));
+    }
+    return object.dump(2) + '\n';
+}
+
+int test(const Options& options)
+{
+    const Findings findings = check();
+    std::cout << (options.json ? jsonOf(findings) : textOf(findings)) << std::flush;
+    if (!std::cout) {
+        throw FileError("<stdout>", cannotBe("written"));
+    }
+    return findings.right() ? success : differencesFound;
+}
+
+}  // namespace
+
+Command addSelfTest(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("selftest", "Prove that this machine gives the promised bits");
+    const auto options = std::make_shared<Options>();
+    command->add_flag("--json", options->json, "Print a JSON object instead of text");
+    command->footer(R"(Decodes blocks of all sizes in every configuration, with each instruction set that the machine
+has and with the components of the model, and compares digests of decisions and log-likelihood
+ratios with those that every machine has to give.
+
+Exit status: 0 all are right, 1 some differ, 2 bad usage.)");
+
+    const auto run = [options] {
+        return test(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik
