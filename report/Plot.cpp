@@ -1,4 +1,4 @@
-// Plot: curves drawn to a file by gnuplot.
+// Plot: curves and shapes drawn to a file by gnuplot.
 #include "Plot.h"
 
 #include <algorithm>
@@ -113,6 +113,16 @@ void writePlot(const std::string& fileName, const std::vector<Curve>& curves, co
     std::string picture = draw(fileName, plotScript(suffix, curves, title));
     if (suffix == ".svg") {
         picture = labelled(std::move(picture), title, description(curves));
+    }
+    simulation::writeAtomically(fileName, picture);
+}
+
+void writeDrawing(const std::string& fileName, const Drawing& drawing)
+{
+    const std::string suffix = suffixOf(fileName);
+    std::string picture = draw(fileName, drawing.script(suffix));
+    if (suffix == ".svg") {
+        picture = labelled(std::move(picture), drawing.title(), drawing.description());
     }
     simulation::writeAtomically(fileName, picture);
 }

@@ -1,4 +1,4 @@
-// Plot: curves drawn to a file by gnuplot.
+// Plot: curves and shapes drawn to a file by gnuplot.
 #ifndef MORVIK_REPORT_PLOT_H
 #define MORVIK_REPORT_PLOT_H
 
@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "Curves.h"
+#include "Drawing.h"
 
 namespace report {
 
@@ -16,6 +17,9 @@ void checkPlot(const std::string& fileName);
 /// Draws BER and BLER against Eb/N0 in the format of the file's suffix, .svg, .png or .pdf. The file appears complete
 /// or not at all. Throws std::runtime_error.
 void writePlot(const std::string& fileName, const std::vector<Curve>& curves, const std::string& title);
+
+/// The same for a picture of shapes.
+void writeDrawing(const std::string& fileName, const Drawing& drawing);
 
 }  // namespace report
 

@@ -14,7 +14,7 @@ namespace report {
 namespace {
 
 // The picture's layout, in points; all panels share its width.
-constexpr int width = 1000;
+constexpr int width = pictureWidth;
 constexpr int headerHeight = 72;  // title and the panels' headings
 constexpr int panelHeight = 430;
 constexpr int axisHeight = 66;  // numbers and name of the horizontal axis
@@ -34,25 +34,6 @@ constexpr double arrowLength = 0.4;  // a bound's arrow goes down to this fracti
 constexpr char ink[] = "#222222";
 constexpr char faintInk[] = "#666666";
 
-/// A string that gnuplot takes as it stands: only the plainest characters are written as themselves.
-std::string quoted(const std::string& text)
-{
-    std::string result = "\"";
-    for (const char c : printable(text)) {
-        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == ' ';
-        if (isPlain) {
-            result += c;
-        } else {
-            const unsigned code = static_cast<unsigned char>(c);
-            result += '\\';
-            for (const unsigned digit : {code >> 6U, code >> 3U & 7U, code & 7U}) {
-                result += std::to_string(digit);
-            }
-        }
-    }
-    return result + '"';
-}
-
 std::string dashType(std::size_t dash)
 {
     const char* const types[] = {"solid", "(9,5)", "(3,3)", "(10,4,2,4)"};
@@ -69,6 +50,12 @@ struct Measures {
     double font;
     double point;
 };
+
+/// The terminals that draw with Cairo measure fonts in points, of which 72 are 96 of their pixels.
+Measures measuresOf(const std::string& suffix)
+{
+    return suffix == ".svg" ? Measures{1, 0.85} : Measures{0.75, 1};
+}
 
 class Script {
 public:
@@ -408,13 +395,39 @@ std::string terminalCommand(const std::string& suffix)
     return std::string("set terminal ") + name + " enhanced background rgb '#ffffff'";
 }
 
+std::string quoted(const std::string& text)
+{
+    std::string result = "\"";
+    for (const char c : printable(text)) {
+        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == ' ';
+        if (isPlain) {
+            result += c;
+        } else {
+            const unsigned code = static_cast<unsigned char>(c);
+            result += '\\';
+            for (const unsigned digit : {code >> 6U, code >> 3U & 7U, code & 7U}) {
+                result += std::to_string(digit);
+            }
+        }
+    }
+    return result + '"';
+}
+
+double fontSize(const std::string& suffix, double points)
+{
+    return points * measuresOf(suffix).font;
+}
+
+std::string openingCommands(const std::string& suffix, int height)
+{
+    return "set encoding utf8\n" + terminalCommand(suffix) + terminalOptions(suffix, height) + " font 'sans-serif," +
+           exact(fontSize(suffix, 13)) + "'\n";
+}
+
 std::string plotScript(const std::string& suffix, const std::vector<Curve>& curves, const std::string& title)
 {
-    // The terminals that draw with Cairo measure fonts in points, of which 72 are 96 of their pixels.
-    const Measures measures = suffix == ".svg" ? Measures{1, 0.85} : Measures{0.75, 1};
-    Script script(curves, title, measures);
-    return "set encoding utf8\n" + terminalCommand(suffix) + terminalOptions(suffix, script.height()) +
-           " font 'sans-serif," + exact(13 * measures.font) + "'\n" + script.text();
+    Script script(curves, title, measuresOf(suffix));
+    return openingCommands(suffix, script.height()) + script.text();
 }
 
 }  // namespace report
