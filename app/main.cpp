@@ -5,6 +5,7 @@
 #include "CommandLine.h"
 #include "Decode.h"
 #include "Doctor.h"
+#include "Info.h"
 #include "Merge.h"
 #include "SelfTest.h"
 
@@ -21,6 +22,7 @@ int main(int argc, char** argv)
                                    morvik::addBer(app),
                                    morvik::addMerge(app),
                                    morvik::addDoctor(app),
+                                   morvik::addInfo(app),
                                    morvik::addSelfTest(app)},
                                   argc,
                                   argv);

@@ -1,0 +1,54 @@
+// BlockLayout: how the core works on a block of K bits, as the model's own components tell it.
+#ifndef MORVIK_BLOCKLAYOUT_H
+#define MORVIK_BLOCKLAYOUT_H
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace morvik {
+
+/// A window of the backward recursion, which runs from its last step down to its first.
+struct Window {
+    unsigned row = 0;
+    unsigned segment = 0;
+    std::uint32_t first = 0;  ///< trellis step
+    std::uint32_t last = 0;
+};
+
+/// How a number of processing units divides a block.
+struct Division {
+    int numPu = 0;
+    unsigned threads = 0;
+    unsigned segments = 0;
+    std::uint32_t segmentLength = 0;     ///< trellis steps
+    std::vector<std::uint32_t> lengths;  ///< of a segment's windows, in their order in the segment: one for each row
+    std::vector<Window> windows;         ///< in the order in which they are computed
+};
+
+struct BlockLayout {
+    std::uint32_t K = 0;
+    std::uint32_t f1 = 0;
+    std::uint32_t f2 = 0;
+    std::vector<unsigned> interleaver;  ///< entry i is the bit that the second encoder takes as its i-th one
+    std::vector<Division> divisions;    ///< for 2, 4 and 8 units
+};
+
+/// Of a block size; throws std::invalid_argument for another K.
+BlockLayout layoutOf(std::uint32_t K);
+
+/// A fixed-point format of the core.
+struct NumberFormat {
+    std::string what;
+    std::string text;  ///< as the components take it
+    unsigned bits;
+    unsigned fraction;
+    double smallest;
+    double largest;
+};
+
+std::vector<NumberFormat> numberFormats();
+
+}  // namespace morvik
+
+#endif

@@ -1,0 +1,251 @@
+// Info: the subcommand that tells what the core makes of a block size.
+#include "Info.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <cstdio>
+#include <iostream>
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <optional>
+#include <stdexcept>
+#include <string>
+
+#include "Arguments.h"
+#include "BlockLayout.h"
+#include "Files.h"
+#include "LayoutPicture.h"
+#include "report/Plot.h"
+#include "standard/BlockSizes.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::optional<std::uint32_t> K;
+    bool table = false;
+    bool json = false;
+    std::string plot;
+};
+
+std::string lengthsText(const Division& division)
+{
+    std::string text;
+    for (std::size_t row = 0; row < division.lengths.size();) {
+        std::size_t end = row;
+        while (end < division.lengths.size() && division.lengths[end] == division.lengths[row]) {
+            ++end;
+        }
+        text += (row == 0 ? "" : ", ") + (end - row > 1 ? std::to_string(end - row) + " x " : "") +
+                std::to_string(division.lengths[row]);
+        row = end;
+    }
+    return text;
+}
+
+std::string textOf(const BlockLayout& layout)
+{
+    const std::string K = std::to_string(layout.K);
+    std::string text = "K = " + K + ": " + std::to_string(layout.K + 4) + " rows of three soft values, " +
+                       std::to_string(layout.K + 3) + " trellis steps\nInterleaver: f1 = " + std::to_string(layout.f1) +
+                       ", f2 = " + std::to_string(layout.f2) + "; the second encoder's bit i is bit (" +
+                       std::to_string(layout.f1) + " i + " + std::to_string(layout.f2) + " i^2) mod " + K +
+                       "\n\nunits  threads  segments  steps of each  rows  steps of the windows\n";
+    for (const Division& division : layout.divisions) {
+        char line[80];
+        std::snprintf(line,
+                      sizeof line,
+                      "%5d %8u %9u %14u %5zu  ",
+                      division.numPu,
+                      division.threads,
+                      division.segments,
+                      division.segmentLength,
+                      division.lengths.size());
+        text += line + lengthsText(division) + '\n';
+    }
+    return text;
+}
+
+std::string textOf(const std::vector<NumberFormat>& formats)
+{
+    std::string text = "numbers                   format    bits  fraction  range\n";
+    for (const NumberFormat& format : formats) {
+        char line[120];
+        std::snprintf(line,
+                      sizeof line,
+                      "%-25s %-8s %5u %9u  %g to %g\n",
+                      format.what.c_str(),
+                      format.text.c_str(),
+                      format.bits,
+                      format.fraction,
+                      format.smallest,
+                      format.largest);
+        text += line;
+    }
+    return text;
+}
+
+/// All block sizes, as ranges with steps.
+std::string sizesText()
+{
+    std::string text = std::to_string(standard::blockSizes.size()) + " block sizes (3GPP TS 36.212, Table 5.1.3-3):";
+    std::size_t first = 0;
+    while (first + 1 < standard::blockSizes.size()) {
+        const std::uint32_t step = standard::blockSizes[first + 1].K - standard::blockSizes[first].K;
+        std::size_t last = first + 1;
+        while (last + 1 < standard::blockSizes.size() &&
+               standard::blockSizes[last + 1].K - standard::blockSizes[last].K == step) {
+            ++last;
+        }
+        text += "\n  " + std::to_string(standard::blockSizes[first].K) + " to " +
+                std::to_string(standard::blockSizes[last].K) + " in steps of " + std::to_string(step);
+        first = last;
+    }
+    return text + '\n';
+}
+
+std::string tableText(const BlockLayout& layout)
+{
+    std::string text = "i,pi\n";
+    for (std::size_t i = 0; i < layout.interleaver.size(); ++i) {
+        text += std::to_string(i) + ',' + std::to_string(layout.interleaver[i]) + '\n';
+    }
+    return text;
+}
+
+using Json = nlohmann::ordered_json;
+
+Json jsonOf(const Division& division)
+{
+    Json windows = Json::array();
+    for (const Window& window : division.windows) {
+        windows.push_back(
+            {{"segment", window.segment}, {"row", window.row}, {"first", window.first}, {"last", window.last}});
+    }
+    return {{"num_pu", division.numPu},
+            {"threads", division.threads},
+            {"segments", division.segments},
+            {"segment_length", division.segmentLength},
+            {"rows", division.lengths.size()},
+            {"window_lengths", division.lengths},
+            {"windows", windows}};
+}
+
+Json jsonOf(const std::vector<NumberFormat>& formats)
+{
+    Json list = Json::array();
+    for (const NumberFormat& format : formats) {
+        list.push_back({{"what", format.what},
+                        {"format", format.text},
+                        {"bits", format.bits},
+                        {"fraction_bits", format.fraction},
+                        {"smallest", format.smallest},
+                        {"largest", format.largest}});
+    }
+    return list;
+}
+
+Json jsonOf(const BlockLayout& layout, bool table)
+{
+    Json object = {{"block_size", layout.K},
+                   {"f1", layout.f1},
+                   {"f2", layout.f2},
+                   {"soft_value_rows", layout.K + 4},
+                   {"trellis_steps", layout.K + 3},
+                   {"divisions", Json::array()}};
+    for (const Division& division : layout.divisions) {
+        object["divisions"].push_back(jsonOf(division));
+    }
+    if (table) {
+        object["interleaver"] = layout.interleaver;
+    }
+    object["formats"] = jsonOf(numberFormats());
+    return object;
+}
+
+std::string generalInformation(const Options& options)
+{
+    if (!options.json) {
+        return sizesText() + '\n' + textOf(numberFormats());
+    }
+    Json object = {{"block_sizes", Json::array()}};
+    for (const standard::BlockSize& size : standard::blockSizes) {
+        object["block_sizes"].push_back({{"block_size", size.K}, {"f1", size.f1}, {"f2", size.f2}});
+    }
+    object["formats"] = jsonOf(numberFormats());
+    return object.dump(2) + '\n';
+}
+
+/// The sizes around a K that is none.
+std::string neighbours(std::uint32_t K)
+{
+    const auto above = std::find_if(standard::blockSizes.begin(),
+                                    standard::blockSizes.end(),
+                                    [K](const standard::BlockSize& size) { return size.K > K; });
+    if (above == standard::blockSizes.begin() || above == standard::blockSizes.end()) {
+        return "they go from 40 to 6144";
+    }
+    return "the next ones are " + std::to_string((above - 1)->K) + " and " + std::to_string(above->K);
+}
+
+std::string information(const Options& options)
+{
+    if (!options.K) {
+        if (options.table || !options.plot.empty()) {
+            throw std::invalid_argument(std::string(options.table ? "--table" : "--plot") + " needs a block size K");
+        }
+        return generalInformation(options);
+    }
+    if (standard::findBlockSize(*options.K) == nullptr) {
+        throw std::invalid_argument(std::to_string(*options.K) +
+                                    " is no block size of 3GPP TS 36.212: " + neighbours(*options.K));
+    }
+    const BlockLayout layout = layoutOf(*options.K);
+    if (!options.plot.empty()) {
+        report::writeDrawing(options.plot, pictureOf(layout));
+    }
+    if (options.json) {
+        return jsonOf(layout, options.table).dump(2) + '\n';
+    }
+    return options.table ? tableText(layout) : textOf(layout) + '\n' + textOf(numberFormats());
+}
+
+int inform(const Options& options)
+{
+    std::cout << information(options) << std::flush;
+    if (!std::cout) {
+        throw FileError("<stdout>", cannotBe("written"));
+    }
+    return success;
+}
+
+}  // namespace
+
+Command addInfo(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("info", "Tell how the core works on a block size");
+    const auto options = std::make_shared<Options>();
+
+    command->add_option("K", options->K, "Block size in bits; without it, all block sizes")
+        ->transform(integerFrom(0, UINT32_MAX))
+        ->type_name("");
+    command->add_flag("--table", options->table, "Print the interleaver as CSV instead; with --json, add it");
+    command->add_flag("--json", options->json, "Print a JSON object instead of text, with all windows in order");
+    command
+        ->add_option("--plot",
+                     options->plot,
+                     "Draw segments and windows in the order in which they are computed, as .svg, .png or .pdf")
+        ->type_name("FILE");
+    command->footer(R"(Exit status: 0 done, 2 bad usage, or a file that cannot be written.
+
+Example:
+  morvik info 1280 --plot windows.svg)");
+
+    const auto run = [options] {
+        return inform(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik
