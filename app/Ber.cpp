@@ -11,7 +11,6 @@
 #include <thread>
 
 #include "BerOptions.h"
-#include "Decoder.h"
 #include "Interruption.h"
 #include "LiveTable.h"
 #include "Pictures.h"
@@ -21,6 +20,7 @@
 #include "simulation/Replay.h"
 #include "simulation/Run.h"
 #include "simulation/ThreadWorkers.h"
+#include "testbench/Decoder.h"
 
 namespace morvik {
 

@@ -11,11 +11,11 @@
 #include <vector>
 
 #include "Arguments.h"
-#include "Decoder.h"
 #include "DecoderOptions.h"
 #include "Files.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "testbench/Decoder.h"
 
 namespace morvik {
 

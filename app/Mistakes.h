@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "SoftBlock.h"
+#include "testbench/SoftBlock.h"
 
 namespace morvik::doctor {
 

@@ -7,7 +7,7 @@
 #include <ostream>
 #include <stdexcept>
 
-#include "Decoder.h"
+#include "testbench/Decoder.h"
 #include "morvik_v1_0_batch.h"
 
 namespace morvik::selftest {

@@ -9,7 +9,7 @@
 
 #include "Files.h"
 #include "LineReader.h"
-#include "SoftBlock.h"
+#include "testbench/SoftBlock.h"
 
 namespace morvik {
 

@@ -7,7 +7,7 @@
 #include <ostream>
 #include <vector>
 
-#include "Decoder.h"
+#include "testbench/Decoder.h"
 #include "DecoderOptions.h"
 #include "Mistakes.h"
 

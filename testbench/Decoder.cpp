@@ -98,6 +98,35 @@ void Decoder::decode(const SoftBlock& block,
     bits.resize(outputs.dout_size);
 }
 
+Decoded Decoder::decodeWithRatios(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag)
+{
+    Decoded decoded;
+    decoded.bits.resize(block.size() - tailPositions);
+    decoded.ratios.resize(decoded.bits.size());
+    veltra_ip_morvik_v1_0_batch_outputs outputs{};
+    outputs.dout = decoded.bits.data();
+    outputs.dout_alloc = decoded.bits.size();
+    outputs.ratios = decoded.ratios.data();
+    outputs.ratios_alloc = decoded.ratios.size();
+    outputs.tags = &decoded.tag;
+    outputs.tags_alloc = 1;
+
+    const Redirection redirection(itsMessages);
+    const auto status = veltra_ip_morvik_v1_0_batch_simulate_i32(itsState.get(),
+                                                                 block.rsc1Sys.data(),
+                                                                 block.rsc1Par.data(),
+                                                                 block.rsc2Par.data(),
+                                                                 static_cast<std::int32_t>(block.size()),
+                                                                 1,
+                                                                 iterations,
+                                                                 &tag,
+                                                                 &outputs);
+    if (status != 0) {
+        throw Refusal(redirection.errors());
+    }
+    return decoded;
+}
+
 void Decoder::Destroy::operator()(veltra_ip_morvik_v1_0_state* state) const
 {
     veltra_ip_morvik_v1_0_destroy_state(state);

@@ -1,6 +1,6 @@
 // Decoder: the C interface of the model as a C++ object.
-#ifndef MORVIK_DECODER_H
-#define MORVIK_DECODER_H
+#ifndef MORVIK_TESTBENCH_DECODER_H
+#define MORVIK_TESTBENCH_DECODER_H
 
 #include <cstdint>
 #include <memory>
@@ -20,6 +20,13 @@ public:
     using std::runtime_error::runtime_error;
 };
 
+/// What a block decodes to.
+struct Decoded {
+    std::vector<std::uint8_t> bits;    ///< each 0 or 1
+    std::vector<std::int16_t> ratios;  ///< log-likelihood ratios of the last pass, as morvik_v1_0_batch.h gives them
+    std::uint32_t tag = 0;             ///< as the core carries it
+};
+
 /// A decoder, whose warnings and traces go to a stream of the caller's choice.
 ///
 /// The library writes to std::cout and std::cerr. During each call those two are redirected: the first to
@@ -37,6 +44,9 @@ public:
 
     /// Decodes a block into `bits`, one element of 0 or 1 for each bit. Throws Refusal.
     void decode(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag, std::vector<std::uint8_t>& bits);
+
+    /// Decodes a block of some bits, with its ratios. Throws Refusal.
+    Decoded decodeWithRatios(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag);
 
 private:
     struct Destroy {
