@@ -18,6 +18,16 @@ CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max);
 /// Allows the first texts of the pairs, and replaces each by its second. For CLI::Option::transform.
 CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& choices);
 
+/// Throws CLI::ValidationError: `text` is not allowed for the option, and what is instead.
+[[noreturn]] void refuse(const std::string& option, const std::string& text, const std::string& allowed);
+
+/// Reads a block size, for a list; otherwise refuses it for --block-size and names the nearest ones.
+void appendBlockSize(const std::string& text, std::vector<unsigned>& values);
+
+/// Reads an Eb/N0 into thousandths of a decibel; otherwise refuses it for --ebn0. `otherwise` is what messages say is
+/// allowed beside numbers.
+int readMilliDecibels(const std::string& text, const std::string& otherwise = "");
+
 }  // namespace morvik
 
 #endif

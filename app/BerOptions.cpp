@@ -13,7 +13,6 @@
 #include "Text.h"
 #include "simulation/Error.h"
 #include "simulation/Thousandths.h"
-#include "standard/BlockSizes.h"
 
 namespace morvik {
 
@@ -25,35 +24,9 @@ using simulation::thousandthsText;
 constexpr std::uint64_t defaultBlockErrors = 100;
 constexpr std::uint64_t defaultMaxBlocks = 1000000;
 constexpr double defaultStopBler = 1e-4;
-constexpr int largestMilliDecibels = 50000;
 constexpr int largestMilliScale = 1000000;
 
-[[noreturn]] void refuse(const std::string& option, const std::string& text, const std::string& allowed)
-{
-    throw CLI::ValidationError(option, shown(text) + " is not allowed, " + allowed);
-}
-
 // ---- Elements of the lists
-
-void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
-{
-    const auto K = parseInteger<std::uint32_t>(text);
-    const auto& sizes = standard::blockSizes;
-    if (!K || *K < sizes.front().K || *K > sizes.back().K) {
-        refuse("--block-size", text, "allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
-    }
-    if (standard::findBlockSize(*K) == nullptr) {
-        std::size_t above = 0;
-        while (sizes[above].K < *K) {
-            ++above;
-        }
-        refuse("--block-size",
-               text,
-               "the nearest block sizes of 3GPP TS 36.212 are " + std::to_string(sizes[above - 1].K) + " and " +
-                   std::to_string(sizes[above].K));
-    }
-    values.push_back(*K);
-}
 
 void appendNumPu(const std::string& text, std::vector<unsigned>& values)
 {
@@ -94,28 +67,22 @@ void appendIterations(const std::string& text, std::vector<unsigned>& values)
     values.push_back(*iterations);
 }
 
-int milliDecibels(const std::string& text)
-{
-    const auto value = parseThousandths(text);
-    if (!value || *value < -largestMilliDecibels || *value > largestMilliDecibels) {
-        refuse("--ebn0", text, "allowed are -50 to 50 dB, with at most three decimals, and START:STEP:STOP");
-    }
-    return *value;
-}
+/// What messages say --ebn0 takes beside numbers.
+constexpr char orRange[] = ", and START:STEP:STOP";
 
 void appendEbn0(const std::string& text, std::vector<int>& values)
 {
     const std::vector<std::string> parts = splitAt(':', text);
     if (parts.size() == 1) {
-        values.push_back(milliDecibels(text));
+        values.push_back(readMilliDecibels(text, orRange));
         return;
     }
     if (parts.size() != 3) {
         refuse("--ebn0", text, "a range is START:STEP:STOP");
     }
-    const int start = milliDecibels(parts[0]);
-    const int step = milliDecibels(parts[1]);
-    const int stop = milliDecibels(parts[2]);
+    const int start = readMilliDecibels(parts[0], orRange);
+    const int step = readMilliDecibels(parts[1], orRange);
+    const int stop = readMilliDecibels(parts[2], orRange);
     if (step <= 0) {
         refuse("--ebn0", text, "the step of a range has to be above 0");
     }

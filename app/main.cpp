@@ -8,6 +8,7 @@
 #include "Info.h"
 #include "Merge.h"
 #include "SelfTest.h"
+#include "Vectors.h"
 
 int main(int argc, char** argv)
 {
@@ -18,12 +19,15 @@ int main(int argc, char** argv)
     app.require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
     app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
     return morvik::runCommandLine(app,
-                                  {morvik::addDecode(app),
-                                   morvik::addBer(app),
-                                   morvik::addMerge(app),
-                                   morvik::addDoctor(app),
-                                   morvik::addInfo(app),
-                                   morvik::addSelfTest(app)},
+                                  {
+                                      morvik::addDecode(app),
+                                      morvik::addBer(app),
+                                      morvik::addMerge(app),
+                                      morvik::addVectors(app),
+                                      morvik::addDoctor(app),
+                                      morvik::addInfo(app),
+                                      morvik::addSelfTest(app),
+                                  },
                                   argc,
                                   argv);
 }

@@ -22,11 +22,11 @@ stage_lint() {
     mkdir -p build/lint
     sed 's/ -fno-tree-[a-z]*//g' build/x86_64/compile_commands.json >build/lint/compile_commands.json
     # Two units of bench/ need packages that are not set up here.
-    git ls-files 'src/*.cpp' 'lanes/*.cpp' 'link/*.cpp' 'simulation/*.cpp' 'report/*.cpp' 'app/*.cpp' 'bindings/*.cpp' 'tests/*.cpp' 'bench/*.cpp' |
+    git ls-files {src,lanes,link,simulation,report,testbench,vectors,app,bindings,tests,bench}/'*.cpp' |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
-        --suppress=internalAstError -I include -I src -I . src link simulation report app
+        --suppress=internalAstError -I include -I src -I . src link simulation report testbench vectors app
 }
 
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.

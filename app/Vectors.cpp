@@ -1,0 +1,207 @@
+// Vectors: the subcommand that makes stimulus and expected values for a test bench.
+#include "Vectors.h"
+
+#include <iostream>
+#include <memory>
+#include <string>
+
+#include "Arguments.h"
+#include "DecoderOptions.h"
+#include "Lists.h"
+#include "simulation/Error.h"
+#include "simulation/Point.h"
+#include "simulation/Thousandths.h"
+#include "vectors/Set.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::string output;
+    std::string checked;
+    DecoderOptions decoder;
+    vectors::Settings settings;
+};
+
+template <class Value, class Text>
+std::string listed(const std::vector<Value>& values, Text textOf)
+{
+    std::string list;
+    for (const Value& value : values) {
+        list += (list.empty() ? "" : ",") + textOf(value);
+    }
+    return list;
+}
+
+/// The command that makes the set again, but for the folder.
+std::string commandOf(const vectors::Settings& settings)
+{
+    const auto itself = [](const std::string& text) {
+        return text;
+    };
+    const auto number = [](auto value) {
+        return std::to_string(value);
+    };
+    const auto algorithm = static_cast<unsigned>(settings.generics.C_ALGORITHM_TYPE);
+    std::string command = "morvik vectors --block-size " + listed(settings.blockSizes, number);
+    command += " --num-pu " + number(settings.generics.C_NUM_PU);
+    command += " --algorithm " + simulation::algorithmName(algorithm);
+    command += " --iterations " + number(settings.iterations);
+    command += " --tag-width " + number(settings.generics.C_TAG_WIDTH);
+    command += " --blocks " + number(settings.blocks);
+    command += " --ebn0 " + simulation::thousandthsText(settings.milliDecibels);
+    command += " --seed " + number(settings.seed);
+    command += settings.directed ? "" : " --no-directed";
+    command += " --format " + listed(settings.formats, itself);
+    command += " --width " + number(settings.width);
+    command += settings.separateStreams ? " --streams separate" : "";
+    command += settings.ratios ? " --soft" : "";
+    command += settings.internal ? " --internal" : "";
+    return command;
+}
+
+void print(const std::string& line)
+{
+    if (!(std::cout << line << std::endl)) {
+        throw simulation::Error("<stdout>: cannot be written");
+    }
+}
+
+std::string blocksAndFormats(const vectors::Manifest& manifest)
+{
+    const auto name = [](const vectors::ManifestFormat& format) {
+        return format.name;
+    };
+    return std::to_string(manifest.blocks.size()) + " blocks in " + listed(manifest.formats, name);
+}
+
+int make(const Options& options)
+{
+    vectors::Manifest manifest;
+    manifest.version = MORVIK_VERSION;
+    manifest.settings = options.settings;
+    manifest.settings.generics = options.decoder.generics;
+    manifest.settings.iterations = options.decoder.iterations;
+    if (manifest.settings.blocks == 0 && !manifest.settings.directed) {
+        throw simulation::Error("--blocks 0 and --no-directed together leave no block");
+    }
+    manifest.command = commandOf(manifest.settings);
+    print(options.output + ": " + blocksAndFormats(vectors::makeSet(options.output, manifest)));
+    return success;
+}
+
+int check(const std::string& folder)
+{
+    const vectors::CheckedSet set = vectors::checkSet(folder);
+    if (set.difference) {
+        print(folder + ": " + *set.difference);
+        return differencesFound;
+    }
+    print(folder + ": " + blocksAndFormats(set.manifest) + ", all as the model decodes them");
+    return success;
+}
+
+int run(const Options& options)
+{
+    if (!options.checked.empty()) {
+        return check(options.checked);
+    }
+    if (options.output.empty() || options.settings.blockSizes.empty()) {
+        throw simulation::Error("--out and --block-size, or --check, are required; 'morvik vectors --help' tells more");
+    }
+    return make(options);
+}
+
+void addBlockOptions(CLI::App& command, vectors::Settings& settings)
+{
+    addListOption(command, "--block-size", settings.blockSizes, appendBlockSize, "Bits of a block, K")
+        ->type_name("K[,K...]");
+    command.add_option("--blocks", settings.blocks, "Random blocks of each size")
+        ->transform(integerFrom(0, 1000000))
+        ->type_name("N")
+        ->capture_default_str();
+    command
+        .add_option_function<std::string>(
+            "--ebn0",
+            [&settings](const std::string& text) { settings.milliDecibels = readMilliDecibels(text); },
+            "Eb/N0 of the random blocks in dB")
+        ->type_name("X")
+        ->default_str("1");
+    command
+        .add_option_function<std::string>(
+            "--seed",
+            [&settings](const std::string& text) {
+                const auto seed = parseInteger<std::uint64_t>(text);
+                if (!seed) {
+                    refuse("--seed", text, "allowed are the integers from 0 to 18446744073709551615");
+                }
+                settings.seed = *seed;
+            },
+            "What bits and noise follow from")
+        ->type_name("N")
+        ->default_str("1");
+    command.add_flag_callback(
+        "--no-directed", [&settings] { settings.directed = false; }, "Leave out the directed blocks");
+}
+
+void addFileOptions(CLI::App& command, vectors::Settings& settings)
+{
+    settings.formats = {"memh"};
+    const auto append = [](const std::string& text, std::vector<std::string>& formats) {
+        if (vectors::findFormat(text) == nullptr) {
+            refuse("--format", text, "allowed are memh, csv, npy, c");
+        }
+        formats.push_back(text);
+    };
+    addListOption(command, "--format", settings.formats, append, "Formats of the files: memh, csv, npy, c")
+        ->type_name("FORMAT[,FORMAT...]")
+        ->default_str("memh");
+    command.add_option("--width", settings.width, "Bits of a soft value in the files: 8, or 16 with the sign extended")
+        ->transform(oneOf({{"8", "8"}, {"16", "16"}}))
+        ->type_name("BITS")
+        ->capture_default_str();
+    command
+        .add_option("--streams", settings.separateStreams, "packed: the streams in one memh file; separate: in three")
+        ->transform(oneOf({{"packed", "false"}, {"separate", "true"}}))
+        ->type_name("HOW")
+        ->default_str("packed");
+    command.add_flag("--soft", settings.ratios, "Expect log-likelihood ratios, too");
+    command.add_flag("--internal", settings.internal, "Expect all values that the model traces, too");
+}
+
+constexpr char explanation[] = R"(
+The folder holds the tables 'blocks', 'stimulus' and 'expected', each as a file of every
+format, and manifest.json with all parameters and the sha256 of each file. Behind the random
+blocks come directed ones: extremes, ties, sizes at which the core cuts blocks in another
+way, tags at the edges. docs/vectors.md tells the layout.
+
+Exit status: 0 made, or all as expected, 1 a difference found, 2 bad input or usage.
+
+Example: words for $readmemh, and the check of them
+  morvik vectors --out k40 --block-size 40 --num-pu 8 --format memh,csv
+  morvik vectors --check k40)";
+
+}  // namespace
+
+Command addVectors(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("vectors", "Make stimulus and expected values for a test bench");
+    const auto options = std::make_shared<Options>();
+    auto* output =
+        command->add_option("--out", options->output, "Folder for a new set of vectors, instead of an earlier one")
+            ->type_name("DIR");
+    command->add_option("--check", options->checked, "Decode the set of vectors in the folder again, and compare")
+        ->type_name("DIR")
+        ->excludes(output);
+    addBlockOptions(*command, options->settings);
+    addDecoderOptions(*command, options->decoder);
+    addFileOptions(*command, options->settings);
+    command->footer(explanation);
+    const auto work = [options] {
+        return run(*options);
+    };
+    return {command, work};
+}
+
+}  // namespace morvik

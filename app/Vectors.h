@@ -1,0 +1,13 @@
+// Vectors: the subcommand that makes stimulus and expected values for a test bench.
+#ifndef MORVIK_VECTORS_H
+#define MORVIK_VECTORS_H
+
+#include "Command.h"
+
+namespace morvik {
+
+Command addVectors(CLI::App& app);
+
+}  // namespace morvik
+
+#endif

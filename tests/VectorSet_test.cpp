@@ -1,0 +1,342 @@
+// A set of vectors in a folder: made, checked, and what the check finds when files are not as they were.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <fstream>
+#include <nlohmann/json.hpp>
+#include <regex>
+#include <string>
+#include <vector>
+
+#include "simulation/Error.h"
+#include "support/TemporaryFolder.h"
+#include "vectors/Checksum.h"
+#include "vectors/Set.h"
+
+namespace {
+
+using morvik::vectors::checkSet;
+using morvik::vectors::makeSet;
+using morvik::vectors::Manifest;
+using morvik::vectors::Settings;
+using morvik::vectors::sha256;
+
+class VectorSet : public testing::Test {
+protected:
+    VectorSet()
+    {
+        settings.blockSizes = {40};
+        settings.blocks = 2;
+        settings.directed = false;
+        settings.iterations = 2;
+        settings.formats = {"c", "csv", "memh", "npy"};
+        settings.ratios = true;
+        settings.internal = true;
+    }
+
+    std::string path() const
+    {
+        return folder.path("set");
+    }
+
+    std::string read(const std::string& file) const
+    {
+        return folder.read("set/" + file);
+    }
+
+    Manifest make() const
+    {
+        Manifest manifest;
+        manifest.version = "1.2.3";
+        manifest.command = "make";
+        manifest.settings = settings;
+        return makeSet(path(), manifest);
+    }
+
+    /// Replaces the first match in a file, and its sha256 in the manifest, as if it had been written so.
+    void change(const std::string& file, const std::string& match, const std::string& replacement) const
+    {
+        const std::string before = sha256(path() + '/' + file);
+        const std::string text =
+            std::regex_replace(read(file), std::regex(match), replacement, std::regex_constants::format_first_only);
+        ASSERT_NE(text, read(file));
+        folder.write("set/" + file, text);
+        const std::string manifest =
+            std::regex_replace(read("manifest.json"), std::regex(before), sha256(path() + '/' + file));
+        folder.write("set/manifest.json", manifest);
+    }
+
+    /// The text without the line that a number, from 1, tells.
+    void removeLine(const std::string& file, std::size_t number) const
+    {
+        change(file, "((?:[^\\n]*\\n){" + std::to_string(number - 1) + "})[^\\n]*\\n", "$1");
+    }
+
+    void expectRefused(const std::string& message) const
+    {
+        try {
+            checkSet(path());
+            FAIL() << "accepted";
+        } catch (const simulation::Error& error) {
+            EXPECT_EQ(error.what(), message);
+        }
+    }
+
+    std::string difference() const
+    {
+        return checkSet(path()).difference.value_or("none");
+    }
+
+    support::TemporaryFolder folder;
+    Settings settings;
+};
+
+TEST_F(VectorSet, IsAsTheModelDecodes)
+{
+    for (const int algorithm : {0, 1, 2}) {
+        for (const int units : {2, 4, 8}) {
+            settings.generics.C_ALGORITHM_TYPE = algorithm;
+            settings.generics.C_NUM_PU = units;
+            make();
+            EXPECT_EQ(difference(), "none");
+        }
+    }
+}
+
+TEST_F(VectorSet, IsAsTheModelDecodesWithAllDirectedBlocks)
+{
+    settings.directed = true;
+    settings.internal = false;
+    settings.blockSizes = {40, 512};
+    settings.width = 16;
+    settings.separateStreams = true;
+    for (const int algorithm : {0, 2}) {
+        settings.generics.C_ALGORITHM_TYPE = algorithm;
+        make();
+        EXPECT_EQ(difference(), "none");
+    }
+}
+
+TEST_F(VectorSet, IsTheSameEachTime)
+{
+    make();
+    const std::string manifest = read("manifest.json");  // with the sha256 of all files
+    make();
+    EXPECT_EQ(read("manifest.json"), manifest);
+}
+
+TEST_F(VectorSet, TellsAllInItsManifest)
+{
+    make();
+    const auto json = nlohmann::json::parse(read("manifest.json"));
+    EXPECT_EQ(json["version"], "1.2.3");
+    EXPECT_EQ(json["command"], "make");
+    EXPECT_EQ(json["parameters"].dump(),
+              R"({"algorithm":"scaled","block_sizes":[40],"blocks":2,"directed":false,"ebn0_db":1.0,"internal":true,)"
+              R"("iterations":2,"num_pu":2,"seed":1,"separate_streams":false,"soft":true,"tag_width":8,"width":8})");
+    EXPECT_EQ(json["blocks"][1].dump(), R"({"block_size":40,"expected_tag":1,"name":"random","tag":1})");
+    ASSERT_EQ(json["formats"].size(), 4U);
+    const auto& memh = json["formats"][2];
+    EXPECT_EQ(memh["files"][1]["name"], "stimulus.memh");
+    EXPECT_EQ(memh["files"][1]["sha256"], sha256(path() + "/stimulus.memh"));
+    EXPECT_EQ(memh["tables"][1]["rows"], 88);
+    EXPECT_EQ(memh["tables"][1]["columns"][0].dump(), R"({"bits":8,"name":"rsc1_sys","signed":true})");
+    EXPECT_EQ(memh["tables"][4]["rows"], 2 * 4 * 43);
+}
+
+TEST_F(VectorSet, KeepsTheStreamsApartInMemhAlone)
+{
+    settings.separateStreams = true;
+    settings.width = 16;
+    make();
+    EXPECT_EQ(read("stimulus_rsc2_par.memh").substr(0, 76),
+              "// stimulus_rsc2_par: hexadecimal digits of a word, from the left: rsc2_par ");
+    EXPECT_EQ(read("stimulus.csv").substr(0, 32), "block,rsc1_sys,rsc1_par,rsc2_par");
+    EXPECT_FALSE(std::ifstream(path() + "/stimulus.memh").is_open());
+}
+
+TEST_F(VectorSet, TakesThePlaceOfAnEarlierOne)
+{
+    make();
+    settings.formats = {"csv"};
+    settings.ratios = false;
+    settings.internal = false;
+    make();
+    EXPECT_EQ(difference(), "none");
+    const std::vector<std::string> left = {"blocks.csv", "expected.csv", "manifest.json", "stimulus.csv"};
+    std::vector<std::string> names;
+    for (const auto& entry : std::filesystem::directory_iterator(path())) {
+        names.push_back(entry.path().filename());
+    }
+    std::sort(names.begin(), names.end());
+    EXPECT_EQ(names, left);
+}
+
+TEST_F(VectorSet, LeavesOtherFoldersAlone)
+{
+    std::filesystem::create_directory(path());
+    folder.write("set/mine.txt", "x");
+    try {
+        make();
+        FAIL() << "accepted";
+    } catch (const simulation::Error& error) {
+        EXPECT_EQ(error.what(), path() + ": is not empty and holds no manifest.json of an earlier set");
+    }
+    EXPECT_EQ(read("mine.txt"), "x");
+}
+
+TEST_F(VectorSet, CannotBeMadeInAFile)
+{
+    folder.write("set", "x");
+    EXPECT_THROW(make(), simulation::Error);
+}
+
+// ---- What a check finds
+
+TEST_F(VectorSet, FindsAnotherDecision)
+{
+    make();
+    change("expected.csv", "\n1,1\n", "\n1,0\n");
+    const std::string found = difference();
+    EXPECT_TRUE(
+        std::regex_match(found, std::regex(R"(csv, block 1 \(random, K = 40\): decision \d+ is 1, expected says 0)")))
+        << found;
+}
+
+TEST_F(VectorSet, FindsAnotherTag)
+{
+    make();
+    change("blocks.c", "1U, 1U", "1U, 3U");
+    EXPECT_EQ(difference(), "c, block 1 (random, K = 40): the tag is 1, blocks says 3");
+}
+
+TEST_F(VectorSet, FindsAnotherRatio)
+{
+    make();
+    change("ratios.csv", "ratio\n0,-?\\d+", "ratio\n0,1234");
+    const std::string found = difference();
+    EXPECT_TRUE(
+        std::regex_match(found, std::regex(R"(csv, block 0 \(random, K = 40\): ratio 0 is -?\d+, ratios says 1234)")))
+        << found;
+}
+
+TEST_F(VectorSet, FindsAnotherInternalValue)
+{
+    make();
+    change("internal.csv", "\n0,1,5,-?\\d+,", "\n0,1,5,2000,");
+    const std::string found = difference();
+    EXPECT_TRUE(std::regex_match(
+        found,
+        std::regex(R"(csv, block 0 \(random, K = 40\): half-iteration 1, step 5, int is -?\d+, internal says 2000)")))
+        << found;
+}
+
+TEST_F(VectorSet, FindsAnInternalRowInTheWrongPlace)
+{
+    make();
+    change("internal.csv", "\n0,1,5,", "\n0,1,6,");
+    EXPECT_EQ(
+        difference(),
+        "csv, block 0 (random, K = 40): half-iteration 1, step 5 stands where internal has half-iteration 1, step 6");
+}
+
+TEST_F(VectorSet, FindsAnotherStimulus)
+{
+    settings.formats = {"csv"};
+    make();
+    change("stimulus.csv", "\n0,-?\\d+,", "\n0,127,");
+    EXPECT_NE(difference(), "none");
+}
+
+TEST_F(VectorSet, RefusesAFileThatIsNotTheOneWritten)
+{
+    make();
+    folder.write("set/expected.npy", read("expected.npy") + "x");
+    expectRefused(path() + "/expected.npy: is not the file that was written, its sha256 differs from the manifest");
+    std::filesystem::remove(path() + "/expected.npy");
+    expectRefused("sha256sum: " + path() + "/expected.npy: No such file or directory");
+}
+
+TEST_F(VectorSet, RefusesTooFewAndTooManyRows)
+{
+    settings.formats = {"csv"};
+    make();
+    removeLine("stimulus.csv", 89);
+    expectRefused(path() + "/stimulus.csv:88: the rows of stimulus end too early for the blocks");
+    make();
+    removeLine("blocks.csv", 3);
+    expectRefused(path() + "/stimulus.csv:46: has more rows of stimulus than the blocks need");
+}
+
+TEST_F(VectorSet, RefusesBlocksThatCannotBe)
+{
+    settings.formats = {"csv"};
+    make();
+    change("blocks.csv", "0,40,2", "0,41,2");
+    expectRefused(path() + "/blocks.csv:2: block_size 41 is none of 3GPP TS 36.212");
+    make();
+    change("blocks.csv", "0,40,2", "0,40,3");
+    expectRefused(path() + "/blocks.csv:2: iterations 3, the manifest says 2");
+}
+
+TEST_F(VectorSet, RefusesSoftValuesOfMoreThanEightBits)
+{
+    settings.formats = {"csv"};
+    settings.width = 16;
+    make();
+    change("stimulus.csv", "\n0,-?\\d+,", "\n0,128,");
+    expectRefused(path() + "/stimulus.csv:2: rsc1_sys 128 is not allowed, allowed are -128 to 127");
+}
+
+TEST_F(VectorSet, RefusesAManifestThatIsNone)
+{
+    settings.formats = {"csv"};
+    make();
+    const std::string good = read("manifest.json");
+    const auto expectManifestRefused =
+        [&](const std::string& match, const std::string& replacement, const std::string& what) {
+            folder.write("set/manifest.json", std::regex_replace(good, std::regex(match), replacement));
+            ASSERT_NE(read("manifest.json"), good) << match;
+            expectRefused(path() + "/manifest.json: " + what);
+        };
+    expectManifestRefused("\"iterations\": 2", "\"iterations\": 16", "iterations 16 is not allowed");
+    expectManifestRefused("\"width\": 8", "\"width\": 12", "width 12 is not allowed");
+    expectManifestRefused("\"scaled\"", "\"best\"", "algorithm \"best\" is not allowed");
+    expectManifestRefused("\"name\": \"csv\"", "\"name\": \"xls\"", "format \"xls\" is not known");
+    expectManifestRefused("ratios.csv", "../ratios.csv", "format csv lacks the file ratios.csv");
+    expectManifestRefused("\"soft\": true", "\"soft\": false", "format csv lacks the file internal.csv");
+    expectManifestRefused("\"internal\": true", "\"internal\": false", "format csv has no file \"internal.csv\"");
+    folder.write("set/manifest.json", "{}");
+    EXPECT_THROW(checkSet(path()), simulation::Error);
+    folder.write("set/manifest.json", "{");
+    EXPECT_THROW(checkSet(path()), simulation::Error);
+    std::filesystem::remove(path() + "/manifest.json");
+    expectRefused(path() + "/manifest.json: cannot be opened: No such file or directory");
+}
+
+TEST_F(VectorSet, RefusesAnotherNumberOfBlocksThanTheManifestNames)
+{
+    settings.formats = {"csv"};
+    const Manifest manifest = make();
+    Manifest other = manifest;
+    other.blocks.pop_back();
+    folder.write("set/manifest.json", manifestText(other));
+    expectRefused(path() + "/manifest.json: names fewer blocks than csv has");
+    other = manifest;
+    other.blocks.push_back(other.blocks.back());
+    folder.write("set/manifest.json", manifestText(other));
+    expectRefused(path() + "/manifest.json: names more blocks than csv has");
+}
+
+TEST(Checksum, IsThatOfTheStandard)
+{
+    const support::TemporaryFolder folder;
+    folder.write("abc", "abc");
+    EXPECT_EQ(sha256(folder.path("abc")), "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
+    folder.write("new\nline", "abc");  // such names are shown in another way
+    EXPECT_EQ(sha256(folder.path("new\nline")), "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
+    EXPECT_THROW(sha256(folder.path("missing")), simulation::Error);
+}
+
+}  // namespace

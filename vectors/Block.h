@@ -1,0 +1,30 @@
+// Block: what goes into the core for one block, and what comes out of it.
+#ifndef MORVIK_VECTORS_BLOCK_H
+#define MORVIK_VECTORS_BLOCK_H
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "testbench/TraceReader.h"
+
+namespace morvik::vectors {
+
+struct Stimulus {
+    std::string name;  ///< what the block is for
+    std::uint32_t K = 0;
+    std::uint32_t tag = 0;
+    std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic and both parities, K + 4 values each
+};
+
+struct Expected {
+    std::uint32_t tag = 0;             ///< as the core carries it
+    std::vector<std::uint8_t> bits;    ///< K decisions of 0 or 1
+    std::vector<std::int16_t> ratios;  ///< in eighths, -2048 to 2047; empty when not asked for
+    std::vector<TraceStep> internal;   ///< K + 3 trellis steps of each half-iteration; empty when not asked for
+};
+
+}  // namespace morvik::vectors
+
+#endif

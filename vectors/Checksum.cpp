@@ -1,0 +1,29 @@
+// Checksum: the SHA-256 of a file.
+#include "Checksum.h"
+
+#include <algorithm>
+#include <system_error>
+
+#include "report/ChildProcess.h"
+#include "simulation/Error.h"
+
+namespace morvik::vectors {
+
+std::string sha256(const std::string& fileName)
+{
+    report::Outcome outcome{};
+    try {
+        outcome = report::runProgram({"sha256sum", "--", fileName}, "");
+    } catch (const std::system_error& error) {
+        throw simulation::Error(std::string("sha256sum cannot be started: ") + error.what());
+    }
+    if (!outcome.succeeded) {
+        throw simulation::Error(outcome.err.substr(0, outcome.err.find('\n')));
+    }
+    constexpr std::size_t digits = 64;
+    std::string& line = outcome.out;
+    line.erase(0, line[0] == '\\' ? 1 : 0);  // marks a name with characters that are shown otherwise
+    return line.substr(0, digits);
+}
+
+}  // namespace morvik::vectors

@@ -1,0 +1,108 @@
+// CsvFormat: tables as comma-separated values; each row opens with the number of its block.
+#include <utility>
+
+#include "Formats.h"
+#include "Numbers.h"
+#include "TextFiles.h"
+#include "simulation/Shown.h"
+
+namespace morvik::vectors {
+
+namespace {
+
+std::string fileOf(const std::string& folder, const Table& table)
+{
+    return folder + '/' + table.name + ".csv";
+}
+
+std::string header(const Table& table)
+{
+    std::string line = "block";
+    for (const Column& column : table.columns) {
+        line += ',' + column.name;
+    }
+    return line;
+}
+
+class CsvWriter : public TableWriter {
+public:
+    CsvWriter(const std::string& folder, const Table& table) : itsFile(fileOf(folder, table))
+    {
+        itsFile.write(header(table) + '\n');
+    }
+
+    void add(std::uint32_t block, const Row& row) override
+    {
+        itsLine = std::to_string(block);
+        for (const std::int64_t value : row) {
+            itsLine += ',';
+            itsLine += std::to_string(value);
+        }
+        itsLine += '\n';
+        itsFile.write(itsLine);
+    }
+
+    void finish() override
+    {
+        itsFile.close();
+    }
+
+private:
+    FileWriter itsFile;
+    std::string itsLine;
+};
+
+class CsvReader : public TableReader {
+public:
+    CsvReader(const std::string& folder, Table table) : itsTable(std::move(table)), itsFile(fileOf(folder, itsTable))
+    {
+        if (!itsFile.next() || itsFile.line() != header(itsTable)) {
+            itsFile.fail("expected \"" + header(itsTable) + '"');
+        }
+    }
+
+    bool next(Row& row) override
+    {
+        if (!itsFile.next()) {
+            return false;
+        }
+        std::string_view rest = itsFile.line();
+        bool isRow = takeInteger(rest).has_value();
+        row.resize(itsTable.columns.size());
+        for (std::size_t i = 0; isRow && i < row.size(); ++i) {
+            const auto value = take(rest, ",") ? takeInteger(rest) : std::nullopt;
+            isRow = value.has_value();
+            row[i] = value.value_or(0);
+        }
+        if (!isRow || !rest.empty()) {
+            itsFile.fail("row " + simulation::shown(itsFile.line()) + ", expected " + std::to_string(row.size() + 1) +
+                         " decimal integers with commas between them");
+        }
+        for (std::size_t i = 0; i < row.size(); ++i) {
+            checkFits(row[i], itsTable.columns[i], place());
+        }
+        return true;
+    }
+
+    std::string place() const override
+    {
+        return itsFile.place();
+    }
+
+private:
+    Table itsTable;
+    LineFile itsFile;
+};
+
+}  // namespace
+
+const Format csvFormat = {"csv",
+                          [](const Table& table) { return std::vector<std::string>{table.name + ".csv"}; },
+                          [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
+                              return std::make_unique<CsvWriter>(folder, table);
+                          },
+                          [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
+                              return std::make_unique<CsvReader>(folder, table);
+                          }};
+
+}  // namespace morvik::vectors

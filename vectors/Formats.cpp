@@ -1,0 +1,51 @@
+// Formats: how each of them writes and reads a table.
+#include "Formats.h"
+
+#include "simulation/Error.h"
+
+namespace morvik::vectors {
+
+const std::vector<Format>& formats()
+{
+    static const std::vector<Format> all = {memhFormat, csvFormat, npyFormat, cFormat};
+    return all;
+}
+
+const Format* findFormat(const std::string& name)
+{
+    for (const Format& format : formats()) {
+        if (format.name == name) {
+            return &format;
+        }
+    }
+    return nullptr;
+}
+
+Storage storageOf(const Table& table)
+{
+    Storage storage;
+    for (const Column& column : table.columns) {
+        storage.isSigned = storage.isSigned || column.isSigned;
+    }
+    for (const Column& column : table.columns) {
+        // Beside values with a sign, others need a bit for it.
+        const unsigned bits = column.bits + (storage.isSigned && !column.isSigned ? 1 : 0);
+        while (storage.bits < bits) {
+            storage.bits *= 2;
+        }
+    }
+    return storage;
+}
+
+void checkFits(std::int64_t value, const Column& column, const std::string& place)
+{
+    const std::int64_t range = std::int64_t{1} << column.bits;
+    const std::int64_t lowest = column.isSigned ? -range / 2 : 0;
+    if (value < lowest || value >= lowest + range) {
+        throw simulation::Error(place + ": " + column.name + ' ' + std::to_string(value) +
+                                " is not allowed, allowed are " + std::to_string(lowest) + " to " +
+                                std::to_string(lowest + range - 1));
+    }
+}
+
+}  // namespace morvik::vectors

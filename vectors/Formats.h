@@ -1,0 +1,34 @@
+// Formats: how each of them writes and reads a table.
+#ifndef MORVIK_VECTORS_FORMATS_H
+#define MORVIK_VECTORS_FORMATS_H
+
+#include "Table.h"
+
+namespace morvik::vectors {
+
+/// Words for $readmemh.
+extern const Format memhFormat;
+
+/// Comma-separated values, with the number of the block before each row.
+extern const Format csvFormat;
+
+/// An array of NumPy.
+extern const Format npyFormat;
+
+/// An array in C, with a header.
+extern const Format cFormat;
+
+/// The bits of the machine's integer that holds any value of the table, and whether it has a sign.
+struct Storage {
+    unsigned bits = 8;  ///< 8, 16 or 32
+    bool isSigned = false;
+};
+
+Storage storageOf(const Table& table);
+
+/// Throws a simulation::Error about the place unless the column holds such values.
+void checkFits(std::int64_t value, const Column& column, const std::string& place);
+
+}  // namespace morvik::vectors
+
+#endif

@@ -1,0 +1,153 @@
+// NpyFormat: tables as arrays of NumPy: rows of columns, a table of one column as a plain row of numbers.
+#include <array>
+#include <fstream>
+#include <utility>
+
+#include "Formats.h"
+#include "Numbers.h"
+#include "TextFiles.h"
+#include "simulation/Error.h"
+
+namespace morvik::vectors {
+
+namespace {
+
+constexpr std::size_t headerSize = 128;  // numbers begin at a multiple of 64 bytes
+constexpr char shapeKey[] = "'shape': (";
+
+std::string fileOf(const std::string& folder, const Table& table)
+{
+    return folder + '/' + table.name + ".npy";
+}
+
+/// The header of format version 1.0, padded with blanks to the size that it always has.
+std::string header(const Table& table, std::uint64_t rows)
+{
+    const Storage storage = storageOf(table);
+    const std::string order = storage.bits == 8 ? "|" : "<";
+    std::string text = "{'descr': '" + order + (storage.isSigned ? 'i' : 'u') + std::to_string(storage.bits / 8) +
+                       "', 'fortran_order': False, " + shapeKey + std::to_string(rows) + ',' +
+                       (table.columns.size() > 1 ? ' ' + std::to_string(table.columns.size()) : "") + "), }";
+    constexpr std::size_t prologue = 10;
+    text.resize(headerSize - prologue, ' ');
+    text.back() = '\n';
+    std::string whole = "\x93NUMPY";
+    whole += {1, 0, static_cast<char>(text.size()), 0};
+    return whole + text;
+}
+
+class NpyWriter : public TableWriter {
+public:
+    NpyWriter(const std::string& folder, Table table)
+        : itsTable(std::move(table)), itsBytes(storageOf(itsTable).bits / 8), itsFile(fileOf(folder, itsTable))
+    {
+        itsFile.write(header(itsTable, 0));
+    }
+
+    void add(std::uint32_t, const Row& row) override
+    {
+        itsPart.clear();
+        for (const std::int64_t value : row) {
+            for (unsigned byte = 0; byte < itsBytes; ++byte) {
+                itsPart += static_cast<char>(static_cast<std::uint64_t>(value) >> 8 * byte & 0xFF);
+            }
+        }
+        itsFile.write(itsPart);
+        ++itsRows;
+    }
+
+    void finish() override
+    {
+        itsFile.overwriteStart(header(itsTable, itsRows));
+        itsFile.close();
+    }
+
+private:
+    Table itsTable;
+    unsigned itsBytes;
+    FileWriter itsFile;
+    std::string itsPart;
+    std::uint64_t itsRows = 0;
+};
+
+class NpyReader : public TableReader {
+public:
+    NpyReader(const std::string& folder, Table table)
+        : itsTable(std::move(table)),
+          itsStorage(storageOf(itsTable)),
+          itsName(fileOf(folder, itsTable)),
+          itsFile(itsName, std::ios::binary),
+          itsPart(itsTable.columns.size() * itsStorage.bits / 8, '\0')
+    {
+        if (!itsFile) {
+            throw simulation::fileError(itsName, "opened");
+        }
+        std::string found(headerSize, '\0');
+        itsFile.read(found.data(), headerSize);
+        const std::size_t key = found.find(shapeKey);
+        std::string_view rest = std::string_view(found).substr(key == std::string::npos ? headerSize : key);
+        const auto rows = take(rest, shapeKey) ? takeInteger(rest) : std::nullopt;
+        if (!rows || found != header(itsTable, static_cast<std::uint64_t>(*rows))) {
+            throw simulation::Error(itsName + ": is no array of NumPy as it was written");
+        }
+        itsRows = static_cast<std::uint64_t>(*rows);
+    }
+
+    bool next(Row& row) override
+    {
+        if (itsRow == itsRows) {
+            if (itsFile.peek() != std::ifstream::traits_type::eof()) {
+                throw simulation::Error(itsName + ": has more numbers than its shape says");
+            }
+            return false;
+        }
+        if (!itsFile.read(itsPart.data(), static_cast<std::streamsize>(itsPart.size()))) {
+            throw simulation::Error(itsName + ": ends before row " + std::to_string(itsRow));
+        }
+        ++itsRow;
+        row.resize(itsTable.columns.size());
+        for (std::size_t i = 0; i < row.size(); ++i) {
+            row[i] = number(i);
+            checkFits(row[i], itsTable.columns[i], place());
+        }
+        return true;
+    }
+
+    std::string place() const override
+    {
+        return itsName + ": row " + std::to_string(itsRow - 1);
+    }
+
+private:
+    std::int64_t number(std::size_t i) const
+    {
+        const std::size_t bytes = itsStorage.bits / 8;
+        std::int64_t value = 0;
+        for (std::size_t byte = 0; byte < bytes; ++byte) {
+            value |= std::int64_t{static_cast<unsigned char>(itsPart[i * bytes + byte])} << 8 * byte;
+        }
+        const std::int64_t range = std::int64_t{1} << itsStorage.bits;
+        return itsStorage.isSigned && value >= range / 2 ? value - range : value;
+    }
+
+    Table itsTable;
+    Storage itsStorage;
+    std::string itsName;
+    std::ifstream itsFile;
+    std::string itsPart;
+    std::uint64_t itsRows = 0;
+    std::uint64_t itsRow = 0;  // how many have been read
+};
+
+}  // namespace
+
+const Format npyFormat = {"npy",
+                          [](const Table& table) { return std::vector<std::string>{table.name + ".npy"}; },
+                          [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
+                              return std::make_unique<NpyWriter>(folder, table);
+                          },
+                          [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
+                              return std::make_unique<NpyReader>(folder, table);
+                          }};
+
+}  // namespace morvik::vectors

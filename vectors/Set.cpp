@@ -1,0 +1,178 @@
+// Set: a folder of vectors, made and checked.
+#include "Set.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <system_error>
+
+#include "Blocks.h"
+#include "Checksum.h"
+#include "Core.h"
+#include "simulation/AtomicFile.h"
+#include "simulation/Error.h"
+#include "simulation/TextFile.h"
+
+namespace morvik::vectors {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string manifestIn(const std::string& folder)
+{
+    return folder + '/' + manifestName;
+}
+
+/// Makes the folder, or removes the set that it holds: first the manifest, without which the rest is no set.
+void clearFolder(const std::string& folder)
+{
+    std::error_code problem;
+    fs::create_directories(folder, problem);
+    if (problem || !fs::is_directory(folder)) {
+        throw simulation::Error(folder + ": cannot be made" + (problem ? ": " + problem.message() : ""));
+    }
+    if (fs::is_empty(folder)) {
+        return;
+    }
+    if (!fs::exists(manifestIn(folder))) {
+        throw simulation::Error(folder + ": is not empty and holds no " + manifestName + " of an earlier set");
+    }
+    const Manifest earlier = parseManifest(simulation::readText(manifestIn(folder)), manifestIn(folder));
+    fs::remove(manifestIn(folder));
+    for (const ManifestFormat& format : earlier.formats) {
+        for (const ManifestFile& file : format.files) {
+            fs::remove(folder + '/' + file.name);
+        }
+    }
+}
+
+/// "decision 3 is 1, expected says 0"
+template <class Value>
+std::string wrong(const std::string& what, const Value& got, const Value& wanted, const std::string& table)
+{
+    return what + " is " + std::to_string(got) + ", " + table + " says " + std::to_string(wanted);
+}
+
+template <class Value>
+std::optional<std::string> differenceOf(const std::string& what,
+                                        const std::vector<Value>& got,
+                                        const std::vector<Value>& wanted,
+                                        const std::string& table)
+{
+    const auto [one, other] = std::mismatch(got.begin(), got.end(), wanted.begin(), wanted.end());
+    if (one == got.end() || other == wanted.end()) {
+        return std::nullopt;
+    }
+    return wrong(what + ' ' + std::to_string(one - got.begin()), *one, *other, table);
+}
+
+std::optional<std::string> differenceOf(const std::vector<TraceStep>& got, const std::vector<TraceStep>& wanted)
+{
+    for (std::size_t i = 0; i < std::min(got.size(), wanted.size()); ++i) {
+        const std::string place =
+            "half-iteration " + std::to_string(got[i].halfIteration) + ", step " + std::to_string(got[i].step);
+        if (got[i].halfIteration != wanted[i].halfIteration || got[i].step != wanted[i].step) {
+            return place + " stands where internal has half-iteration " + std::to_string(wanted[i].halfIteration) +
+                   ", step " + std::to_string(wanted[i].step);
+        }
+        for (std::size_t signal = 0; signal < traceSignals.size(); ++signal) {
+            if (got[i].values[signal] != wanted[i].values[signal]) {
+                return wrong(
+                    place + ", " + traceSignals[signal], got[i].values[signal], wanted[i].values[signal], "internal");
+            }
+        }
+    }
+    return std::nullopt;
+}
+
+/// The first difference between what the model gives and what a file says.
+std::optional<std::string> differenceOf(const Expected& got, const Expected& wanted)
+{
+    if (got.tag != wanted.tag) {
+        return wrong("the tag", got.tag, wanted.tag, "blocks");
+    }
+    if (auto difference = differenceOf("decision", got.bits, wanted.bits, "expected")) {
+        return difference;
+    }
+    if (auto difference = differenceOf("ratio", got.ratios, wanted.ratios, "ratios")) {
+        return difference;
+    }
+    return differenceOf(got.internal, wanted.internal);
+}
+
+/// Checks one format; the first difference.
+std::optional<std::string> checkFormat(const std::string& folder,
+                                       const Manifest& manifest,
+                                       const ManifestFormat& format)
+{
+    for (const ManifestFile& file : format.files) {
+        const std::string path = folder + '/' + file.name;
+        if (sha256(path) != file.sha256) {
+            throw simulation::Error(path + ": is not the file that was written, its sha256 differs from the manifest");
+        }
+    }
+    Core core(manifest.settings);
+    BlockReader reader(folder, *findFormat(format.name), manifest.settings);
+    Stimulus stimulus;
+    Expected expected;
+    std::size_t number = 0;
+    for (; reader.next(stimulus, expected); ++number) {
+        if (number == manifest.blocks.size()) {
+            throw simulation::Error(manifestIn(folder) + ": names fewer blocks than " + format.name + " has");
+        }
+        if (const auto difference = differenceOf(core.expect(stimulus), expected)) {
+            return format.name + ", block " + std::to_string(number) + " (" + manifest.blocks[number].name +
+                   ", K = " + std::to_string(stimulus.K) + "): " + *difference;
+        }
+    }
+    if (number < manifest.blocks.size()) {
+        throw simulation::Error(manifestIn(folder) + ": names more blocks than " + format.name + " has");
+    }
+    return std::nullopt;
+}
+
+}  // namespace
+
+Manifest makeSet(const std::string& folder, Manifest manifest)
+{
+    clearFolder(folder);
+    std::vector<BlockWriter> writers;
+    for (const std::string& name : manifest.settings.formats) {
+        writers.emplace_back(folder, *findFormat(name), manifest.settings);
+    }
+    Core core(manifest.settings);
+    forEachStimulus(manifest.settings, [&](const Stimulus& stimulus) {
+        const Expected expected = core.expect(stimulus);
+        for (BlockWriter& writer : writers) {
+            writer.add(stimulus, expected);
+        }
+        manifest.blocks.push_back({stimulus.name, stimulus.K, stimulus.tag, expected.tag});
+    });
+    for (std::size_t i = 0; i < writers.size(); ++i) {
+        writers[i].finish();
+        ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
+        for (const KeptTable& kept : format.tables) {
+            for (const std::string& name : findFormat(format.name)->files(kept.table)) {
+                format.files.push_back({name, sha256(folder + '/' + name)});
+            }
+        }
+        manifest.formats.push_back(format);
+    }
+    simulation::writeAtomically(manifestIn(folder), manifestText(manifest));
+    return manifest;
+}
+
+CheckedSet checkSet(const std::string& folder)
+{
+    CheckedSet checked;
+    checked.manifest = parseManifest(simulation::readText(manifestIn(folder)), manifestIn(folder));
+    for (const ManifestFormat& format : checked.manifest.formats) {
+        checked.difference = checkFormat(folder, checked.manifest, format);
+        if (checked.difference) {
+            break;
+        }
+    }
+    return checked;
+}
+
+}  // namespace morvik::vectors
