@@ -7,9 +7,9 @@
 #include <ostream>
 #include <vector>
 
-#include "testbench/Decoder.h"
 #include "DecoderOptions.h"
 #include "Mistakes.h"
+#include "testbench/Decoder.h"
 
 namespace morvik::doctor {
 
