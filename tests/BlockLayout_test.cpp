@@ -82,8 +82,8 @@ TEST(BlockLayout, InterleaverIsThePolynomial)
 {
     const BlockLayout layout = layoutOf(6144);
     ASSERT_EQ(layout.interleaver.size(), 6144U);
-    for (std::uint64_t i = 0; i < 6144; ++i) {
-        ASSERT_EQ(layout.interleaver[i], (263 * i + 480 * i * i) % 6144);
+    for (unsigned i = 0; i < 6144; ++i) {
+        ASSERT_EQ(layout.interleaver[i], (263 + std::uint64_t{480} * i) * i % 6144);
     }
 }
 
