@@ -73,6 +73,7 @@
 %!error <par2 has to be a full matrix of real numbers, not complex double> morvik_decode(soft, soft, complex(soft, 1));
 %!error <there is no option 'units'; there are num_pu, algorithm, iterations, tag_width, tags, class> morvik_decode(soft, soft, soft, 'units', 2);
 %!error id=morvik:badOption morvik_decode(soft, soft, soft, 5, 2);
+%!error id=morvik:badOption morvik_decode(soft, soft, soft, 'num_pu', 3);
 %!error <C_NUM_PU must be either 2, 4 or 8> morvik_decode(soft, soft, soft, 'num_pu', 3);
 %!error id=morvik:badOption morvik_decode(soft, soft, soft, 'num_pu', 2.5);
 %!error id=morvik:badOption morvik_decode(soft, soft, soft, 'num_pu', [2 4]);
