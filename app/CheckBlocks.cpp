@@ -56,6 +56,7 @@ std::string hexadecimal(std::uint64_t digest)
 std::vector<CheckBatch> checkBatches()
 {
     std::vector<CheckBatch> batches;
+    batches.reserve(standard::blockSizes.size());
     for (const standard::BlockSize& size : standard::blockSizes) {
         batches.push_back(batchOf(size.K, static_cast<std::uint32_t>(batches.size())));
     }

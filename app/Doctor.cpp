@@ -49,8 +49,9 @@ std::vector<doctor::Case> readCases(const Options& options)
     SoftValueReader blocks(input.stream(), input.name());
     ReferenceBits reference(referenceFile.stream(), referenceFile.name());
     std::vector<doctor::Case> cases;
-    doctor::Case read;
-    while (cases.size() < options.blocks && blocks.next(read.received)) {
+    SoftBlock received;
+    while (cases.size() < options.blocks && blocks.next(received)) {
+        doctor::Case read{received, {}};
         read.sent = reference.next();
         check(read, blocks, reference);
         cases.push_back(std::move(read));

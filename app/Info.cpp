@@ -180,9 +180,9 @@ std::string generalInformation(const Options& options)
 /// The sizes around a K that is none.
 std::string neighbours(std::uint32_t K)
 {
-    const auto above = std::find_if(standard::blockSizes.begin(),
-                                    standard::blockSizes.end(),
-                                    [K](const standard::BlockSize& size) { return size.K > K; });
+    const auto* const above = std::find_if(standard::blockSizes.begin(),
+                                           standard::blockSizes.end(),
+                                           [K](const standard::BlockSize& size) { return size.K > K; });
     if (above == standard::blockSizes.begin() || above == standard::blockSizes.end()) {
         return "they go from 40 to 6144";
     }

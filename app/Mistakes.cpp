@@ -241,7 +241,8 @@ void restoreOrder(Case& block, Order order)
     case Order::rowsReversed:
     case Order::dataReversed:
         for (Stream* stream : streamsOf(block.received)) {
-            std::reverse(stream->begin(), stream->end() - (order == Order::dataReversed ? tailRows : 0));
+            const std::ptrdiff_t unmoved = order == Order::dataReversed ? tailRows : 0;
+            std::reverse(stream->begin(), stream->end() - unmoved);
         }
         break;
     case Order::sentReversed:

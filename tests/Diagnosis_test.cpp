@@ -19,6 +19,7 @@ using support::SentFrame;
 std::vector<Case> casesOf(const std::vector<SentFrame>& frames)
 {
     std::vector<Case> cases;
+    cases.reserve(frames.size());
     for (const SentFrame& frame : frames) {
         cases.push_back({{frame.soft.sys, frame.soft.par1, frame.soft.par2}, {frame.bits.begin(), frame.bits.end()}});
     }

@@ -27,6 +27,7 @@ void expectWhatUndoingGives(const std::vector<Case>& cases, const std::vector<Su
 {
     for (const Suspicion& suspicion : found) {
         std::vector<Case> right;
+        right.reserve(cases.size());
         for (const Case& each : cases) {
             right.push_back(undone(each, suspicion.mistakes));
         }

@@ -19,7 +19,7 @@ Decode genericDecode(int numPu, int algorithm, const std::string& instructionSet
 MakeDecode spoilt(const std::function<void(const CheckBatch&, Decided&)>& spoil)
 {
     return [spoil](int numPu, int algorithm, const std::string& instructionSet) -> Decode {
-        const Decode decode = genericDecode(numPu, algorithm, instructionSet);
+        Decode decode = genericDecode(numPu, algorithm, instructionSet);
         if (!decode || numPu != 4 || algorithm != 2) {
             return decode;
         }
