@@ -61,12 +61,10 @@ std::optional<std::int16_t> traceValue(std::string_view field)
 /// Whether a line stands between the passes and their rows and holds no values of them.
 bool isBetween(std::string_view line)
 {
-    for (const char* const start : {"---", "itsSys ", "itsPar0[", "itsPar1[", "n    int ", "WARNING:"}) {
-        if (startsWith(line, start)) {
-            return true;
-        }
-    }
-    return false;
+    constexpr std::array<std::string_view, 6> starts = {
+        "---", "itsSys ", "itsPar0[", "itsPar1[", "n    int ", "WARNING:"};
+    return std::any_of(
+        starts.begin(), starts.end(), [line](std::string_view start) { return startsWith(line, start); });
 }
 
 }  // namespace

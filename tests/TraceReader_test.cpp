@@ -85,7 +85,7 @@ TEST(TraceReader, FindsTheRatiosOfTheLastPass)
     const TracedBlock traced;
     const std::vector<TraceStep> steps = stepsOf(traced.trace);
     for (std::size_t k = 0; k < 40; ++k) {
-        EXPECT_EQ(steps[3 * 43 + k].values[21], traced.decoded.ratios[k] / 16) << k;
+        EXPECT_EQ(steps[std::size_t{3} * 43 + k].values[21], traced.decoded.ratios[k] / 16) << k;
     }
 }
 

@@ -145,6 +145,16 @@ TEST_F(VectorSet, TellsAllInItsManifest)
     EXPECT_EQ(memh["tables"][4]["rows"], 2 * 4 * 43);
 }
 
+TEST_F(VectorSet, TellsWhereABlockBegins)
+{
+    settings.blockSizes = {40, 48};
+    settings.formats = {"csv"};
+    make();
+    EXPECT_EQ(read("blocks.csv"),
+              "block,block_size,iterations,tag,expected_tag,first_position,first_bit\n"
+              "0,40,2,0,0,0,0\n1,40,2,1,1,44,40\n2,48,2,2,2,88,80\n3,48,2,3,3,140,128\n");
+}
+
 TEST_F(VectorSet, KeepsTheStreamsApartInMemhAlone)
 {
     settings.separateStreams = true;

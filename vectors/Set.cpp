@@ -18,9 +18,14 @@ namespace {
 
 namespace fs = std::filesystem;
 
+std::string pathOf(const std::string& folder, const std::string& name)
+{
+    return folder + '/' + name;
+}
+
 std::string manifestIn(const std::string& folder)
 {
-    return folder + '/' + manifestName;
+    return pathOf(folder, manifestName);
 }
 
 /// Makes the folder, or removes the set that it holds: first the manifest, without which the rest is no set.
@@ -41,7 +46,7 @@ void clearFolder(const std::string& folder)
     fs::remove(manifestIn(folder));
     for (const ManifestFormat& format : earlier.formats) {
         for (const ManifestFile& file : format.files) {
-            fs::remove(folder + '/' + file.name);
+            fs::remove(pathOf(folder, file.name));
         }
     }
 }
@@ -106,7 +111,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
                                        const ManifestFormat& format)
 {
     for (const ManifestFile& file : format.files) {
-        const std::string path = folder + '/' + file.name;
+        const std::string path = pathOf(folder, file.name);
         if (sha256(path) != file.sha256) {
             throw simulation::Error(path + ": is not the file that was written, its sha256 differs from the manifest");
         }
@@ -153,7 +158,7 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
         ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
         for (const KeptTable& kept : format.tables) {
             for (const std::string& name : findFormat(format.name)->files(kept.table)) {
-                format.files.push_back({name, sha256(folder + '/' + name)});
+                format.files.push_back({name, sha256(pathOf(folder, name))});
             }
         }
         manifest.formats.push_back(format);
