@@ -3,26 +3,10 @@
 
 #include "morvik_v1_0_batch.h"
 
-// The linker puts the first function in the place of the library's, which becomes the second (--wrap).
-extern "C" std::int32_t __wrap_veltra_ip_morvik_v1_0_batch_simulate_i16(veltra_ip_morvik_v1_0_state* state,
-                                                                        const std::int16_t* rsc1_sys,
-                                                                        const std::int16_t* rsc1_par,
-                                                                        const std::int16_t* rsc2_par,
-                                                                        std::int32_t din_size,
-                                                                        std::uint32_t blocks,
-                                                                        std::uint32_t iterations,
-                                                                        const std::uint32_t* tags,
-                                                                        veltra_ip_morvik_v1_0_batch_outputs* outputs);
-
-extern "C" std::int32_t __real_veltra_ip_morvik_v1_0_batch_simulate_i16(veltra_ip_morvik_v1_0_state* state,
-                                                                        const std::int16_t* rsc1_sys,
-                                                                        const std::int16_t* rsc1_par,
-                                                                        const std::int16_t* rsc2_par,
-                                                                        std::int32_t din_size,
-                                                                        std::uint32_t blocks,
-                                                                        std::uint32_t iterations,
-                                                                        const std::uint32_t* tags,
-                                                                        veltra_ip_morvik_v1_0_batch_outputs* outputs);
+// The linker puts the second function in the place of the library's, which becomes the first. The names are its own.
+// NOLINTBEGIN(bugprone-reserved-identifier)
+extern "C" decltype(veltra_ip_morvik_v1_0_batch_simulate_i16) __real_veltra_ip_morvik_v1_0_batch_simulate_i16;
+extern "C" decltype(veltra_ip_morvik_v1_0_batch_simulate_i16) __wrap_veltra_ip_morvik_v1_0_batch_simulate_i16;
 
 std::int32_t __wrap_veltra_ip_morvik_v1_0_batch_simulate_i16(veltra_ip_morvik_v1_0_state* state,
                                                              const std::int16_t* rsc1_sys,
@@ -41,3 +25,4 @@ std::int32_t __wrap_veltra_ip_morvik_v1_0_batch_simulate_i16(veltra_ip_morvik_v1
     }
     return status;
 }
+// NOLINTEND(bugprone-reserved-identifier)
