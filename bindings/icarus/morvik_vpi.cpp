@@ -5,6 +5,7 @@
 //     status = $morvik_decode(handle, sys, par1, par2, size, iterations, tag, dout);
 //     tag = $morvik_tag(handle);                                              of the last block
 //     $morvik_destroy(handle);
+#include <sv_vpi_user.h>
 #include <vpi_user.h>
 
 #include <cstddef>
@@ -75,17 +76,26 @@ std::vector<vpiHandle> argumentsOf(vpiHandle call)
     return all;
 }
 
-/// The low 32 bits of a value, extended by its sign where it is narrower and `isSigned`.
+/// A value, extended by its sign where it is narrower than 32 bits and `isSigned`. What is wider has to fit in them.
 int valueOf(vpiHandle object, bool isSigned, const std::string& name)
 {
     const int width = vpi_get(vpiSize, object);
     s_vpi_value value{};
     value.format = vpiVectorVal;
     vpi_get_value(object, &value);
-    if (value.value.vector[0].bval != 0) {
-        throw Mistake(name + " has bits that are x or z");
+    const s_vpi_vecval* const words = value.value.vector;
+    const auto bits = static_cast<std::uint32_t>(words[0].aval);
+    const bool isNegative = isSigned && width > 32 && bits >> 31 != 0;
+    for (int i = 0; i * 32 < width; ++i) {
+        if (words[i].bval != 0) {
+            throw Mistake(name + " has bits that are x or z");
+        }
+        const int unused = width - i * 32 < 32 ? 32 - (width - i * 32) : 0;
+        const std::uint32_t extension = isNegative ? ~std::uint32_t{0} >> unused : 0;
+        if (i > 0 && static_cast<std::uint32_t>(words[i].aval) != extension) {
+            throw Mistake(name + " does not fit in 32 bits");
+        }
     }
-    const auto bits = static_cast<std::uint32_t>(value.value.vector[0].aval);
     const std::uint32_t sign = isSigned && width < 32 ? std::uint32_t{1} << (width - 1) : 0;
     return static_cast<std::int32_t>((bits ^ sign) - sign);
 }
@@ -175,9 +185,11 @@ int decode(const std::vector<vpiHandle>& arguments)
     Session& session = sessionOf(arguments[0]);
     const int size = argument(arguments[4], "The size");
     const int firstDecision = firstIndex(arguments[7], size > 4 ? size - 4 : 0);
+    const int iterations = argument(arguments[5], "The number of iterations");
+    const auto tag = static_cast<std::uint32_t>(argument(arguments[6], "The tag"));
+    // Last: what has been put belongs to the next block, whatever call decodes it.
     putStreams(session, {arguments[1], arguments[2], arguments[3]}, size);
-    const int status = session.decode(argument(arguments[5], "iterations"),
-                                      static_cast<std::uint32_t>(argument(arguments[6], "The tag")));
+    const int status = session.decode(iterations, tag);
     reportMessages(session);
     for (std::size_t i = 0; i < session.bits().size(); ++i) {
         setValue(vpi_handle_by_index(arguments[7], firstDecision + static_cast<int>(i)), session.bits()[i]);
@@ -210,14 +222,41 @@ bool isArray(vpiHandle object)
     return type == vpiMemory || type == vpiNetArray;
 }
 
+/// Real numbers and texts have no bits that could be asked for.
+bool isInteger(vpiHandle object)
+{
+    const int type = vpi_get(vpiType, object);
+    if (type == vpiConstant || type == vpiParameter) {
+        const int kind = vpi_get(vpiConstType, object);
+        return kind != vpiRealConst && kind != vpiStringConst;
+    }
+    return type != vpiRealVar && type != vpiStringVar;
+}
+
+/// Elements of an array of real numbers appear to have one bit, as those of hard bits.
+void checkSoftValues(vpiHandle array, const std::string& name)
+{
+    const int width = vpi_get(vpiSize, vpi_handle_by_index(array, firstIndex(array, 1)));
+    if (width < 2 || width > 32) {
+        throw Mistake(name + ", " + vpi_get_str(vpiName, array) + ", must be an array of integers of 2 to 32 bits");
+    }
+}
+
 void checkArgument(vpiHandle object, char kind, std::size_t number)
 {
     const std::string name = "argument " + std::to_string(number);
     if (isArray(object) != (kind != 'i')) {
-        throw Mistake(name + (kind == 'i' ? " is an array, but must be a value" : " must be an array"));
+        throw Mistake(name +
+                      (kind == 'i' ? " is an array, but must be a value" : " must be an array, one of a fixed size"));
     }
-    if (kind == 'a' && vpi_get(vpiSize, vpi_handle_by_index(object, firstIndex(object, 1))) > 32) {
-        throw Mistake(name + ", " + vpi_get_str(vpiName, object) + ", must be an array of at most 32 bits each");
+    if (kind == 'i' && !isInteger(object)) {
+        throw Mistake(name + " must be an integer");
+    }
+    if (kind == 'a') {
+        checkSoftValues(object, name);
+    }
+    if (kind == 'd' && vpi_get(vpiType, object) == vpiNetArray) {
+        throw Mistake(name + ", " + vpi_get_str(vpiName, object) + ", must be an array of variables, not of nets");
     }
 }
 
@@ -229,8 +268,8 @@ PLI_INT32 check(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): th
     try {
         const auto arguments = argumentsOf(vpi_handle(vpiSysTfCall, nullptr));
         if (arguments.size() != kinds.size()) {
-            throw Mistake("takes " + std::to_string(kinds.size()) + " arguments, not " +
-                          std::to_string(arguments.size()));
+            throw Mistake("takes " + std::to_string(kinds.size()) + (kinds.size() == 1 ? " argument" : " arguments") +
+                          ", not " + std::to_string(arguments.size()));
         }
         for (std::size_t i = 0; i < kinds.size(); ++i) {
             checkArgument(arguments[i], kinds[i], i + 1);

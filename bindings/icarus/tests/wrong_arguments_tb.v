@@ -4,12 +4,22 @@ module wrong_arguments_tb;
     reg [32:0] wide_values [0:43];
     reg signed [7:0] values [0:43];
     reg dout [0:39];
+    real number, numbers [0:43];
+    wire nets [0:39];
 
     initial begin
         status = $morvik_create(2, 1);
         status = $morvik_decode(1, values, values, wide_values, 44, 8, 0, dout);
         status = $morvik_decode(1, values, status, values, 44, 8, 0, dout);
         status = $morvik_create(2, values, 8);
+        status = $morvik_create(number, 1, 8);
+        status = $morvik_create(2, 1.5, 8);
+        status = $morvik_create(2, "scaled", 8);
+        status = $morvik_create(2, 1, number + 1);
+        status = $morvik_decode(1, numbers, values, values, 44, 8, 0, dout);
+        status = $morvik_decode(1, values, dout, values, 44, 8, 0, dout);
+        status = $morvik_decode(1, values, values, values, 44, 8, 0, nets);
+        $morvik_destroy(1, 2);
         $display("the simulation has begun");
     end
 endmodule
