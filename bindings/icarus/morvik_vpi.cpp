@@ -184,6 +184,9 @@ int decode(const std::vector<vpiHandle>& arguments)
 {
     Session& session = sessionOf(arguments[0]);
     const int size = argument(arguments[4], "The size");
+    if (size <= 0) {
+        throw Mistake("The size is " + std::to_string(size) + ", but a block of K bits has K + 4 positions");
+    }
     const int firstDecision = firstIndex(arguments[7], size > 4 ? size - 4 : 0);
     const int iterations = argument(arguments[5], "The number of iterations");
     const auto tag = static_cast<std::uint32_t>(argument(arguments[6], "The tag"));

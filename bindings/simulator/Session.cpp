@@ -94,6 +94,9 @@ int Session::decode(int iterations, std::uint32_t tag)
     int status = 1;
     if (!open()) {
         itsMessages.emplace_back("ERROR:binding:The generics of this decoder were refused, so it does not decode");
+    } else if (itsPositions == 0) {
+        itsMessages.emplace_back(
+            "ERROR:binding:The streams are empty, but a block of K bits has K + 4 soft values in each");
     } else if (itsPositions > mostPositions) {
         itsMessages.push_back("ERROR:binding:Block size not supported" + sizeHint(itsPositions));
     } else {

@@ -152,7 +152,7 @@ package body morvik_pkg is
         elsif sys'length /= par1'length or sys'length /= par2'length then
             report_line("ERROR:binding:The streams differ in length: sys has " & integer'image(sys'length) &
                 " values, par1 " & integer'image(par1'length) & ", par2 " & integer'image(par2'length));
-        elsif bits'length /= sys'length - 4 then
+        elsif sys'length >= 4 and bits'length /= sys'length - 4 then
             report_line("ERROR:binding:Streams of " & integer'image(sys'length) & " values, the tail included, have " &
                 integer'image(sys'length - 4) & " decisions, but bits has room for " & integer'image(bits'length));
         else

@@ -67,7 +67,7 @@ module wrong_use_tb;
         expect_that(model, 1, {"ERROR:binding:Block size not supported: 6149 soft values in each stream are not K + 4 ",
             "for a block size K of 3GPP TS 36.212"});
         decode(model, 0, 0, 0, 8);
-        expect_that(model, 1, "ERROR:decoder:din_size must be a positive integer");
+        expect_that(model, 1, "ERROR:binding:The streams are empty, but a block of K bits has K + 4 soft values in each");
         decode(model, 44, 43, 44, 8);
         expect_that(model, 1, "ERROR:binding:The streams differ in length: sys has 44 values, par1 43, par2 44");
         decode(model, 44, 44, 44, 0);

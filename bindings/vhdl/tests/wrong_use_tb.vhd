@@ -44,6 +44,12 @@ begin
         morvik_decode(model, sys(0 to 39), par1(0 to 39), par2(0 to 39), rest, status);
         assert status = morvik_block_refused severity failure;
 
+        report "streams without values, or with less than a tail";
+        morvik_decode(model, sys(1 to 0), par1(1 to 0), par2(1 to 0), rest, status);
+        assert status = morvik_argument_refused severity failure;
+        morvik_decode(model, sys(0 to 2), par1(0 to 2), par2(0 to 2), rest, status);
+        assert status = morvik_block_refused severity failure;
+
         report "iterations outside of 1 to 15";
         bits := (others => '1');
         morvik_decode(model, sys, par1, par2, bits, status, iterations => 0);
