@@ -5,6 +5,8 @@
 #include <pybind11/pybind11.h>
 #include <pybind11/stl.h>
 
+#include <unistd.h>
+
 #include <cstring>
 #include <optional>
 #include <utility>
@@ -30,6 +32,31 @@ std::size_t sizeOf(py::ssize_t extent)
 {
     return static_cast<std::size_t>(extent);
 }
+
+/// Gives the interpreter's lock away while it lives. Where the interpreter has ended meanwhile, because this is a
+/// daemon thread, to ask for the lock unwinds the thread, past owners of objects that must not be touched any more. It
+/// rests instead, until the process ends.
+class Unlocked {
+public:
+    Unlocked() : itsThread(PyEval_SaveThread()) {}
+
+    ~Unlocked()
+    {
+        try {
+            PyEval_RestoreThread(itsThread);
+        } catch (...) {
+            for (;;) {
+                pause();
+            }
+        }
+    }
+
+    Unlocked(const Unlocked&) = delete;
+    Unlocked& operator=(const Unlocked&) = delete;
+
+private:
+    PyThreadState* itsThread;
+};
 
 // ---- Decoding
 
@@ -64,7 +91,7 @@ py::tuple decode(Decoder& decoder,
     batch.keptTags = keptTags.mutable_data();
     Outcome outcome;
     {
-        const py::gil_scoped_release unlocked;
+        const Unlocked unlocked;
         outcome = decoder.decode(batch, threads);
     }
     return py::make_tuple(outcome.status, outcome.messages.error, outcome.messages.warnings, bits, keptTags, ratios);
@@ -97,7 +124,7 @@ void addDecoder(py::module_& module)
     addDecode<std::int16_t>(decoder);
     addDecode<std::int32_t>(decoder);
     // Each of these may have to wait for a thread that decodes.
-    const py::call_guard<py::gil_scoped_release> unlocked;
+    const py::call_guard<Unlocked> unlocked;
     decoder.def("close", &Decoder::close, unlocked);
     decoder.def_property_readonly("closed", py::cpp_function(&Decoder::isClosed, unlocked));
     decoder.def_property_readonly("instruction_set", py::cpp_function(&Decoder::instructionSet, unlocked));
@@ -143,7 +170,7 @@ py::tuple encode(const Array<std::uint8_t>& bits)
     }
     const std::uint8_t* from = bits.data();
     {
-        const py::gil_scoped_release unlocked;
+        const Unlocked unlocked;
         TurboEncoder encoder(static_cast<unsigned>(K));
         morvik::link::PackedBlocks information{encoder.words(), {}};
         TurboEncoder::Streams encoded;
@@ -266,7 +293,7 @@ py::list simulate(const simulation::Sweep& sweep,
     const Listeners listeners = listenersOf(progress);
     std::vector<simulation::ResultRow> rows;
     {
-        const py::gil_scoped_release unlocked;
+        const Unlocked unlocked;
         rows = errorRates(plan, threads, instructionSet, listeners);
     }
     return fieldsOf(rows);

@@ -1,6 +1,8 @@
 """Threads: those of a call, and those of the caller."""
 
 import os
+import subprocess
+import sys
 import threading
 import time
 from concurrent.futures import ThreadPoolExecutor
@@ -131,3 +133,26 @@ def test_works_in_a_forked_process(blocks, expected):
         decoded = morvik.Decoder(threads=3).decode(*blocks)
         os._exit(0 if np.array_equal(decoded.bits, expected.bits) else 1)
     assert os.waitpid(child, 0)[1] == 0
+
+
+_DAEMONS = """
+import threading, time
+import morvik, numpy
+soft = numpy.full((20, 6148), -24, numpy.int8)
+def decode():
+    decoder = morvik.Decoder(threads=1)
+    while True:
+        decoder.decode(soft, soft, soft)
+def simulate():
+    morvik.error_rate(512, 0.5, block_errors=10**9, max_blocks=10**9, threads=1, progress=print)
+for call in (decode, decode, simulate):
+    threading.Thread(target=call, daemon=True).start()
+time.sleep(0.3)
+print("ends")
+"""
+
+
+def test_the_interpreter_ends_while_daemon_threads_work():
+    for _ in range(3):
+        ended = subprocess.run([sys.executable, "-c", _DAEMONS], capture_output=True, text=True, timeout=100)
+        assert (ended.returncode, ended.stdout, ended.stderr) == (0, "ends\n", "")
