@@ -50,11 +50,13 @@ public:
     /// algorithm    0 max-log, 1 scaled, 2 table
     /// iterations   1 to 15
     /// latency      from a block to its decisions
+    /// tagWidth     bits of a block's tag, 0 to 32
     MorvikDecoder(const sc_core::sc_module_name& name,
                   int numPu,
                   int algorithm,
                   unsigned iterations,
-                  const sc_core::sc_time& latency = sc_core::SC_ZERO_TIME)
+                  const sc_core::sc_time& latency = sc_core::SC_ZERO_TIME,
+                  int tagWidth = 8)
         : sc_module(name),
           in("in"),
           out("out"),
@@ -65,6 +67,7 @@ public:
         auto generics = veltra_ip_morvik_v1_0_get_default_generics();
         generics.C_NUM_PU = numPu;
         generics.C_ALGORITHM_TYPE = algorithm;
+        generics.C_TAG_WIDTH = tagWidth;
         Listener listener;
         itsState.reset(veltra_ip_morvik_v1_0_create_state(generics));
         listener.report();
@@ -125,11 +128,19 @@ private:
     {
         MorvikDecisions decisions;
         if (block.sys.size() != block.par1.size() || block.sys.size() != block.par2.size()) {
-            SC_REPORT_ERROR("morvik", "The streams of a block differ in length");
+            SC_REPORT_ERROR(
+                "morvik",
+                ("The streams differ in length: sys has " + std::to_string(block.sys.size()) + " values, par1 " +
+                 std::to_string(block.par1.size()) + ", par2 " + std::to_string(block.par2.size()))
+                    .c_str());
+            return decisions;
+        }
+        if (block.sys.empty()) {
+            SC_REPORT_ERROR("morvik", "The streams are empty, but a block of K bits has K + 4 soft values in each");
             return decisions;
         }
         const std::size_t positions = block.sys.size();
-        decisions.bits.resize(positions + 1);  // has an address for an empty block, too, which is refused for its size
+        decisions.bits.resize(positions);
         veltra_ip_morvik_v1_0_outputs outputs{
             decisions.bits.data(), static_cast<std::uint32_t>(decisions.bits.size()), 0, 0};
         Listener listener;

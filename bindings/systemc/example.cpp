@@ -23,7 +23,9 @@ public:
         : sc_module(name), out("out"), itsK(K), itsFile(file)
     {
         std::string header;
-        std::getline(itsFile, header);
+        if (!std::getline(itsFile, header)) {
+            SC_REPORT_ERROR("example", (std::string(file) + " cannot be read").c_str());
+        }
         SC_HAS_PROCESS(Source);
         SC_THREAD(run);
     }
@@ -59,6 +61,9 @@ public:
     Scoreboard(const sc_core::sc_module_name& name, const char* file, int brokenBlock, int brokenBit)
         : sc_module(name), in("in"), itsFile(file), itsBrokenBlock(brokenBlock), itsBrokenBit(brokenBit)
     {
+        if (!itsFile) {
+            SC_REPORT_ERROR("example", (std::string(file) + " cannot be read").c_str());
+        }
         SC_HAS_PROCESS(Scoreboard);
         SC_THREAD(run);
     }
@@ -110,7 +115,12 @@ int sc_main(int argc, char* argv[])
         std::cerr << "example K SOFT DECISIONS [BLOCK BIT]\n";
         return 2;
     }
-    Source source("source", std::strtoul(argv[1], nullptr, 10), argv[2]);
+    const unsigned long K = std::strtoul(argv[1], nullptr, 10);
+    if (K < 40 || K > 6144) {
+        std::cerr << argv[1] << " is no block size: they are 40 to 6144\n";
+        return 2;
+    }
+    Source source("source", K, argv[2]);
     MorvikDecoder decoder("decoder", 4, 1, 8, sc_core::sc_time(10, sc_core::SC_US));
     Scoreboard scoreboard(
         "scoreboard", argv[3], argc == 6 ? std::atoi(argv[4]) : -1, argc == 6 ? std::atoi(argv[5]) : 0);

@@ -107,11 +107,11 @@ int sc_main(int argc, char* argv[])
     refuse(rig,
            zeros(40),
            "morvik: ERROR:TDecoder3G:Block size not supported: 40 soft values in each stream, must be K + 4");
-    refuse(rig, zeros(0), "morvik: ERROR:decoder:din_size must be a positive integer");
+    refuse(rig, zeros(0), "morvik: The streams are empty, but a block of K bits has K + 4 soft values in each");
     refuse(endless, zeros(44), "morvik: ERROR:decoder:Number of iterations must be in the range 1 to 15");
     MorvikSoftBlock uneven = zeros(44);
     uneven.par2.pop_back();
-    refuse(rig, uneven, "morvik: The streams of a block differ in length");
+    refuse(rig, uneven, "morvik: The streams differ in length: sys has 44 values, par1 44, par2 43");
     MorvikSoftBlock loud = zeros(44);
     loud.par1[9] = 1000;
     expect("loud block", std::to_string(rig.decode(loud).bits.size()), "40");

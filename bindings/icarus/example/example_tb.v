@@ -6,7 +6,7 @@
 //     +decisions=FILE   a line of K bits for each block
 //     +break_block=B +break_bit=I   turns bit I of block B over, as a bug of the device would
 module example_tb;
-    reg [8 * 256 - 1:0] soft_name, decisions_name;
+    reg [8 * 256 - 1:0] soft_name, decisions_name, header;
     integer soft_file, decisions_file, K, break_block, break_bit;
     integer model, status, blocks, wrong_bits, read, number, value_sys, value_par1, value_par2, i;
     reg device;
@@ -47,6 +47,10 @@ module example_tb;
             $display("+K=N, +soft=FILE or +decisions=FILE is missing");
             $finish_and_return(2);
         end
+        if (K < 40 || K > 6144) begin
+            $display("+K=%0d is no block size: they are 40 to 6144", K);
+            $finish_and_return(2);
+        end
         if (!$value$plusargs("break_block=%d", break_block))
             break_block = -1;
         if (!$value$plusargs("break_bit=%d", break_bit))
@@ -57,9 +61,7 @@ module example_tb;
             $display("%0s or %0s cannot be read", soft_name, decisions_name);
             $finish_and_return(2);
         end
-        read = $fgetc(soft_file);
-        while (read != "\n")  // the header
-            read = $fgetc(soft_file);
+        read = $fgets(header, soft_file);
         model = $morvik_create(4, 1, 8);  // processing units, algorithm, width of the tag
         blocks = 0;
         wrong_bits = 0;

@@ -10,6 +10,8 @@ module example_tb;
     bit clk = 0;
     initial forever #5 clk = !clk;
 
+    localparam int longest_idle = 100_000;  // clocks: more than a core needs for a block
+
     int K;
     logic din_valid = 0;
     logic signed [7:0] sys, par1, par2;
@@ -52,8 +54,11 @@ module example_tb;
     // The scoreboard: compares the device's decisions, as they come, with the model's.
     task automatic compare();
         for (int i = 0; i < K; i++) begin
-            while (!dout_valid)
+            for (int idle = 0; !dout_valid; idle++) begin
+                if (idle == longest_idle)
+                    $fatal(1, "the device gives no decisions");
                 @(negedge clk);
+            end
             if (dout !== model.dout[i]) begin
                 wrong_bits++;
                 $display("block %0d, bit %0d: the device decides %b, the model %b", blocks, i, dout, model.dout[i]);
@@ -63,15 +68,20 @@ module example_tb;
     endtask
 
     initial begin
-        string name;
+        string name, header;
+        int read;
         bit more;
         soft_values_t soft_sys, soft_par1, soft_par2;
         if (!$value$plusargs("K=%d", K) || !$value$plusargs("soft=%s", name))
             $fatal(1, "+K=N or +soft=FILE is missing");
+        if (K < 40 || K > 6144)
+            $fatal(1, "+K=%0d is no block size: they are 40 to 6144", K);
         file = $fopen(name, "r");
         if (file == 0)
             $fatal(1, "%s cannot be read", name);
-        while ($fgetc(file) != "\n");  // the header
+        read = $fgets(header, file);
+        if (read == 0)
+            $fatal(1, "%s is empty", name);
         model = new(4, ALGORITHM_SCALED);
         more = read_block(soft_sys, soft_par1, soft_par2);
         while (more) begin
