@@ -8,7 +8,7 @@
 %                   matrices of K + 4 rows, a block in each column, its tail in the last four rows. One block may also
 %                   be three rows; then bits and ratios are rows, too. A positive value favours bit 1, and 8 steps make
 %                   one. They are clipped to -128 ... 127. int8, int16 and int32 are decoded as they are; values of
-%                   other classes have to be whole numbers.
+%                   other classes have to be whole numbers. Unsigned ones are refused.
 % bits              K decisions in each column, logical
 % ratios            log-likelihood ratios of the decisions, int16, 128 steps to one
 % tags              block tags, cut to tag_width bits, a row of uint32
@@ -19,7 +19,7 @@
 %   algorithm   'scaled'   'max-log', 'scaled' (max-log, extrinsic values times 0.75) or 'table' (max-log with a
 %                          correction table)
 %   iterations  8          1 to 15
-%   tag_width   8          bits of the block tags, 0 to 31
+%   tag_width   8          bits of the block tags, 0 to 32; as in the hardware, 32 keeps none
 %   tags        zeros      a block tag for each column, 0 to 2^32 - 1
 %   class       'logical'  class of bits: 'logical' or 'int8'
 %
@@ -76,6 +76,10 @@ function same_size(sys, par1, par2)
             'morvik_decode: sys, par1 and par2 have to be matrices of one size, but they are %s, %s and %s', ...
             size_text(sys), size_text(par1), size_text(par2));
     end
+    if size(sys, 1) == 0
+        error('morvik:badSize', ['morvik_decode: sys, par1 and par2 are empty (%s), but every column is a block of ' ...
+            'K + 4 values'], size_text(sys));
+    end
 end
 
 function text = size_text(array)
@@ -87,6 +91,10 @@ function values = whole(name, values)
     if ~isnumeric(values) || ~isreal(values) || issparse(values)
         error('morvik:badClass', 'morvik_decode: %s has to be a full matrix of real numbers, not %s', ...
             name, class_text(values));
+    end
+    if strncmp(class(values), 'uint', 4)
+        error('morvik:badClass', ['morvik_decode: %s is of class %s, which has no negative values; soft values are ' ...
+            'negative for bit 0'], name, class(values));
     end
     % Within 24 bits, which are what the hardware looks at.
     if any(values(:) ~= fix(values(:))) || any(values(:) < -2^23) || any(values(:) >= 2^23)

@@ -134,10 +134,13 @@ std::int32_t decode(mxArray* results[], const mxArray* const* arguments, std::st
 
     const Listener listener;
     const State state = createState(configuration);
-    const std::int32_t status =
-        state == nullptr
-            ? argumentRefused
-            : simulate(state.get(), arguments, static_cast<std::uint32_t>(configuration[3]), tags, outputs);
+    const std::int32_t status = state == nullptr
+                                    ? argumentRefused
+                                    : simulate(state.get(),
+                                               arguments,
+                                               static_cast<std::uint32_t>(static_cast<std::int32_t>(configuration[3])),
+                                               tags,
+                                               outputs);
     messages = listener.text();
     return status;
 }

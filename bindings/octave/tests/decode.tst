@@ -56,6 +56,8 @@
 %!error id=morvik:badCall morvik_decode(soft, soft, soft, 'num_pu');
 %!error <sys, par1 and par2 have to be matrices of one size, but they are 44x1, 43x1 and 44x1> morvik_decode(soft, soft(1:43), soft);
 %!error id=morvik:badSize morvik_decode(soft, soft.', soft);
+%!error id=morvik:badSize morvik_decode([], [], []);
+%!error <sys, par1 and par2 are empty \(0x5\)> morvik_decode(zeros(0, 5), zeros(0, 5), zeros(0, 5));
 %!error id=morvik:badSize morvik_decode(soft(1:40), soft(1:40), soft(1:40));
 %!error <Block size not supported: there are 40 rows, but every column is a block of K \+ 4 values, the tail included> morvik_decode(soft(1:40), soft(1:40), soft(1:40));
 %!error <there are 3 rows> morvik_decode(wide.', wide.', wide.');
@@ -71,6 +73,7 @@
 %!error id=morvik:badClass morvik_decode({soft}, {soft}, {soft});
 %!error <sys has to be a full matrix of real numbers, not sparse double> morvik_decode(sparse(soft), soft, soft);
 %!error <par2 has to be a full matrix of real numbers, not complex double> morvik_decode(soft, soft, complex(soft, 1));
+%!error <sys is of class uint8, which has no negative values> morvik_decode(uint8(soft), uint8(soft), uint8(soft));
 %!error <there is no option 'units'; there are num_pu, algorithm, iterations, tag_width, tags, class> morvik_decode(soft, soft, soft, 'units', 2);
 %!error id=morvik:badOption morvik_decode(soft, soft, soft, 5, 2);
 %!error id=morvik:badOption morvik_decode(soft, soft, soft, 'num_pu', 3);
