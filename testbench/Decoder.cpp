@@ -6,6 +6,7 @@
 #include <string>
 
 #include "morvik_v1_0_batch.h"
+#include "src/DecoderState.h"
 
 namespace morvik {
 
@@ -125,6 +126,12 @@ Decoded Decoder::decodeWithRatios(const SoftBlock& block, std::uint32_t iteratio
         throw Refusal(redirection.errors());
     }
     return decoded;
+}
+
+TDecoder& Decoder::component()
+{
+    useInstructionSet("component");
+    return *itsState->decoder;
 }
 
 void Decoder::Destroy::operator()(veltra_ip_morvik_v1_0_state* state) const

@@ -12,6 +12,8 @@
 #include "SoftBlock.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
+class TDecoder;
+
 namespace morvik {
 
 /// The library refused; the text is the line in which it told why.
@@ -47,6 +49,9 @@ public:
 
     /// Decodes a block of some bits, with its ratios. Throws Refusal.
     Decoded decodeWithRatios(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag);
+
+    /// The component that decodes, whose values a test bench watches. From now on it decodes every block.
+    TDecoder& component();
 
 private:
     struct Destroy {
