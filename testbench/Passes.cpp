@@ -1,0 +1,69 @@
+// Passes: every value that the core computes on a block, one half-iteration at a time.
+#include "Passes.h"
+
+#include <vector>
+
+#include "src/TDecoder3GPU.h"
+
+namespace morvik {
+
+namespace {
+
+/// Signals of one kind begin here in passSignals.
+enum FirstSignal : unsigned { intrinsic = 0, branch = 1, forward = 5, backward = 13, ratio = 21, extrinsic = 22 };
+
+short alignedValue(const TDecoder& decoder, unsigned signal, std::uint32_t step)
+{
+    if (signal == extrinsic) {
+        return decoder.itsExtrinsic[step];
+    }
+    if (signal == ratio) {
+        return decoder.itsLLR[step];
+    }
+    if (signal >= backward) {
+        return decoder.itsBeta[step][signal - backward];
+    }
+    if (signal >= forward) {
+        return decoder.itsAlpha[step][signal - forward];
+    }
+    return signal >= branch ? decoder.itsGamma[step][signal - branch] : decoder.itsIntrinsic[step];
+}
+
+}  // namespace
+
+Passes::Passes(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, std::ostream& warnings)
+    : itsDecoder(generics, warnings), itsComponent(dynamic_cast<TDecoder3GPU&>(itsDecoder.component()))
+{
+    // One iteration leaves the streams in the component, as the core takes them; half-iteration 0 starts afresh.
+    std::vector<std::uint8_t> bits;
+    itsDecoder.decode(block, 1, 0, bits);
+    if (bits.empty()) {
+        throw Refusal("holds no bit but those of the tail");
+    }
+    itsDivision.emplace(itsComponent);
+}
+
+const Division& Passes::division() const
+{
+    return *itsDivision;
+}
+
+void Passes::next()
+{
+    itsComponent.calcSISO(itsNext);
+    ++itsNext;
+}
+
+std::int16_t Passes::value(unsigned signal, std::uint32_t step) const
+{
+    constexpr int bitsBelowEighth = 4;
+    return static_cast<std::int16_t>(alignedValue(itsComponent, signal, step) >> bitsBelowEighth);
+}
+
+bool Passes::isComputed(unsigned signal, std::uint32_t step) const
+{
+    const std::uint32_t K = itsDivision->K();
+    return step < K || signal == intrinsic || (step == K && signal >= forward && signal < backward);
+}
+
+}  // namespace morvik
