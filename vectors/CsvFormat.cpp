@@ -26,7 +26,7 @@ std::string header(const Table& table)
 
 class CsvWriter : public TableWriter {
 public:
-    CsvWriter(const std::string& folder, const Table& table) : itsFile(fileOf(folder, table))
+    CsvWriter(FileWriter file, const Table& table) : itsFile(std::move(file))
     {
         itsFile.write(header(table) + '\n');
     }
@@ -96,10 +96,15 @@ private:
 
 }  // namespace
 
+std::unique_ptr<TableWriter> csvWriter(FileWriter file, const Table& table)
+{
+    return std::make_unique<CsvWriter>(std::move(file), table);
+}
+
 const Format csvFormat = {"csv",
                           [](const Table& table) { return std::vector<std::string>{table.name + ".csv"}; },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
-                              return std::make_unique<CsvWriter>(folder, table);
+                              return csvWriter(FileWriter(fileOf(folder, table)), table);
                           },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
                               return std::make_unique<CsvReader>(folder, table);

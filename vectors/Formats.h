@@ -3,6 +3,7 @@
 #define MORVIK_VECTORS_FORMATS_H
 
 #include "Table.h"
+#include "TextFiles.h"
 
 namespace morvik::vectors {
 
@@ -17,6 +18,10 @@ extern const Format npyFormat;
 
 /// An array in C, with a header.
 extern const Format cFormat;
+
+/// Write a table to a file of any name. What csvWriter gets need not be a file that seeks.
+std::unique_ptr<TableWriter> csvWriter(FileWriter file, const Table& table);
+std::unique_ptr<TableWriter> npyWriter(FileWriter file, const Table& table);
 
 /// The bits of the machine's integer that holds any value of the table, and whether it has a sign.
 struct Storage {

@@ -38,8 +38,8 @@ std::string header(const Table& table, std::uint64_t rows)
 
 class NpyWriter : public TableWriter {
 public:
-    NpyWriter(const std::string& folder, Table table)
-        : itsTable(std::move(table)), itsBytes(storageOf(itsTable).bits / 8), itsFile(fileOf(folder, itsTable))
+    NpyWriter(FileWriter file, Table table)
+        : itsTable(std::move(table)), itsBytes(storageOf(itsTable).bits / 8), itsFile(std::move(file))
     {
         itsFile.write(header(itsTable, 0));
     }
@@ -141,10 +141,15 @@ private:
 
 }  // namespace
 
+std::unique_ptr<TableWriter> npyWriter(FileWriter file, const Table& table)
+{
+    return std::make_unique<NpyWriter>(std::move(file), table);
+}
+
 const Format npyFormat = {"npy",
                           [](const Table& table) { return std::vector<std::string>{table.name + ".npy"}; },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
-                              return std::make_unique<NpyWriter>(folder, table);
+                              return npyWriter(FileWriter(fileOf(folder, table)), table);
                           },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
                               return std::make_unique<NpyReader>(folder, table);

@@ -1,36 +1,50 @@
 // TextFiles: files that are written and read in pieces, with their places in messages.
 #include "TextFiles.h"
 
+#include <iostream>
+#include <utility>
+
 #include "simulation/Error.h"
 
 namespace morvik::vectors {
 
-FileWriter::FileWriter(const std::string& fileName) : itsName(fileName), itsFile(fileName, std::ios::binary)
+FileWriter::FileWriter(const std::string& fileName)
+    : FileWriter(fileName, std::make_unique<std::ofstream>(fileName, std::ios::binary))
 {
-    if (!itsFile) {
+    if (!*itsStream) {
         fail();
     }
 }
 
+FileWriter::FileWriter(std::string name, std::unique_ptr<std::ostream> stream)
+    : itsName(std::move(name)), itsStream(std::move(stream))
+{
+}
+
+FileWriter FileWriter::standardOutput()
+{
+    return {"<stdout>", std::make_unique<std::ostream>(std::cout.rdbuf())};
+}
+
 void FileWriter::write(std::string_view text)
 {
-    if (!itsFile.write(text.data(), static_cast<std::streamsize>(text.size()))) {
+    if (!itsStream->write(text.data(), static_cast<std::streamsize>(text.size()))) {
         fail();
     }
 }
 
 void FileWriter::overwriteStart(std::string_view text)
 {
-    itsFile.seekp(0);
+    itsStream->seekp(0);
     write(text);
 }
 
 void FileWriter::close()
 {
-    itsFile.close();
-    if (!itsFile) {
+    if (!itsStream->flush()) {
         fail();
     }
+    itsStream.reset();
 }
 
 void FileWriter::fail() const

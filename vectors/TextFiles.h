@@ -5,15 +5,20 @@
 #include <cstddef>
 #include <cstdint>
 #include <fstream>
+#include <memory>
+#include <ostream>
 #include <string>
 #include <string_view>
 
 namespace morvik::vectors {
 
-/// A new file. What goes wrong is thrown as a simulation::Error that opens with the file.
+/// A new file, or standard output. What goes wrong is thrown as a simulation::Error that opens with the file.
 class FileWriter {
 public:
     explicit FileWriter(const std::string& fileName);
+
+    /// To standard output, as it is now: redirecting std::cout afterwards changes nothing.
+    static FileWriter standardOutput();
 
     void write(std::string_view text);
 
@@ -24,10 +29,11 @@ public:
     void close();
 
 private:
+    FileWriter(std::string name, std::unique_ptr<std::ostream> stream);
     [[noreturn]] void fail() const;
 
     std::string itsName;
-    std::ofstream itsFile;
+    std::unique_ptr<std::ostream> itsStream;
 };
 
 /// Reads lines that end in \n or \r\n. What goes wrong is thrown as a simulation::Error that opens with the place.
