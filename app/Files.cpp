@@ -30,6 +30,15 @@ std::string cannotBe(const std::string& action)
     return "cannot be " + action + ": " + std::generic_category().message(errno);
 }
 
+void expectOwnFile(const std::string& path, const std::vector<std::string>& inputs, const std::string& content)
+{
+    for (const std::string& input : inputs) {
+        if (isSameFile(path, input)) {
+            throw FileError(path, "is read as " + input + ", " + content + " need a file of their own");
+        }
+    }
+}
+
 InputFile::InputFile(const std::string& path)
     : itsName(path == standardStream ? "<stdin>" : path), itsStream(path == standardStream ? std::cin : itsFile)
 {
@@ -57,11 +66,7 @@ OutputFile::OutputFile(const std::string& path, const std::vector<std::string>& 
     if (isStandardOutput()) {
         return;
     }
-    for (const std::string& input : inputs) {
-        if (isSameFile(path, input)) {
-            throw FileError(itsName, "is read as " + input + ", the decisions need a file of their own");
-        }
-    }
+    expectOwnFile(path, inputs, "the decisions");
     itsFile.open(path, std::ios::binary);
     if (!itsFile) {
         throw FileError(itsName, cannotBe("written"));

@@ -25,6 +25,9 @@ public:
 /// "cannot be ACTION: " and the operating system's reason for the failure just seen.
 std::string cannotBe(const std::string& action);
 
+/// Throws FileError when the file that is to take the content, in the plural, is one of `inputs`.
+void expectOwnFile(const std::string& path, const std::vector<std::string>& inputs, const std::string& content);
+
 /// A file open for reading, or standard input.
 class InputFile {
 public:

@@ -8,6 +8,7 @@
 #include "Info.h"
 #include "Merge.h"
 #include "SelfTest.h"
+#include "Trace.h"
 #include "Vectors.h"
 
 int main(int argc, char** argv)
@@ -24,6 +25,7 @@ int main(int argc, char** argv)
                                       morvik::addBer(app),
                                       morvik::addMerge(app),
                                       morvik::addVectors(app),
+                                      morvik::addTrace(app),
                                       morvik::addDoctor(app),
                                       morvik::addInfo(app),
                                       morvik::addSelfTest(app),

@@ -1,0 +1,219 @@
+// Trace: the subcommand that writes the values inside of chosen passes.
+#include "Trace.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <iostream>
+#include <memory>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "Arguments.h"
+#include "DecoderOptions.h"
+#include "Files.h"
+#include "Lists.h"
+#include "SoftValueReader.h"
+#include "simulation/Error.h"
+#include "standard/BlockSizes.h"
+#include "trace/TraceWriter.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::string input = standardStream;
+    std::string output = standardStream;
+    std::string format = "text";
+    std::string halfIterations;
+    std::uint32_t block = 0;
+    DecoderOptions decoder;
+    trace::Selection selection;
+};
+
+/// Reads --half-iterations, N or A:B; without it, all are selected.
+void selectPasses(const Options& options, trace::Selection& selection)
+{
+    const std::uint32_t passes = 2 * options.decoder.iterations;
+    selection.last = passes - 1;
+    if (options.halfIterations.empty()) {
+        return;
+    }
+    const std::vector<std::string> ends = splitAt(':', options.halfIterations);
+    const auto first = parseInteger<std::uint32_t>(ends.front());
+    const auto last = parseInteger<std::uint32_t>(ends.back());
+    if (ends.size() > 2 || !first || !last || *first > *last || *last >= passes) {
+        throw simulation::Error("--half-iterations: " + shown(options.halfIterations) +
+                                " is not allowed, allowed are N and A:B, A not above B, from 0 to " +
+                                std::to_string(passes - 1) + " (two for each of --iterations)");
+    }
+    selection.first = *first;
+    selection.last = *last;
+}
+
+/// Appends the signals of a name: one, or all that differ from it in a number behind it.
+void appendSignals(const std::string& text, std::vector<unsigned>& signals)
+{
+    const std::size_t before = signals.size();
+    for (unsigned i = 0; i < passSignals.size(); ++i) {
+        const std::string name = passSignals[i];
+        if (name == text || name.substr(0, name.find_last_not_of("0123456789") + 1) == text) {
+            signals.push_back(i);
+        }
+    }
+    if (signals.size() == before) {
+        refuse(
+            "--signals",
+            text,
+            "known are intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to beta7 (beta), llr, extrinsic");
+    }
+}
+
+void appendUnit(const std::string& text, std::vector<std::uint32_t>& units)
+{
+    const auto unit = parseInteger<std::uint32_t>(text);
+    if (!unit) {
+        refuse("--units", text, "allowed are numbers of units, from 0");
+    }
+    units.push_back(*unit);
+}
+
+void checkUnits(const Options& options, const Division& division)
+{
+    for (const std::uint32_t unit : options.selection.units) {
+        if (unit >= division.units()) {
+            const std::uint32_t last = division.units() - 1;
+            throw simulation::Error("--units: unit " + std::to_string(unit) + " computes nothing of a block of " +
+                                    std::to_string(division.K()) + " bits with --num-pu " +
+                                    std::to_string(options.decoder.generics.C_NUM_PU) + ", unit" +
+                                    (last > 0 ? "s 0 to " + std::to_string(last) + " do" : " 0 does"));
+        }
+    }
+}
+
+SoftBlock readBlock(const Options& options)
+{
+    InputFile input(options.input);
+    SoftValueReader reader(input.stream(), input.name());
+    SoftBlock block;
+    for (std::uint32_t number = 0; number <= options.block; ++number) {
+        if (!reader.next(block)) {
+            throw FileError(input.name(),
+                            "has no block " + std::to_string(options.block) + ", the last one is block " +
+                                std::to_string(number - 1));
+        }
+    }
+    if (standard::findBlockSize(static_cast<std::uint32_t>(block.size() - tailPositions)) == nullptr) {
+        reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
+    }
+    return block;
+}
+
+vectors::FileWriter openOutput(const Options& options)
+{
+    if (options.output == standardStream) {
+        return vectors::FileWriter::standardOutput();
+    }
+    expectOwnFile(options.output, {options.input}, "its traced values");
+    return vectors::FileWriter(options.output);
+}
+
+std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const Division& division)
+{
+    if (options.format == "vcd") {
+        return trace::vcdTrace(openOutput(options), division, options.selection);
+    }
+    const vectors::Table table = trace::traceTable(options.selection);
+    auto rows = options.format == "csv" ? vectors::csvWriter(openOutput(options), table)
+                                        : vectors::npyWriter(openOutput(options), table);
+    return trace::tableTrace(std::move(rows), options.block, options.selection);
+}
+
+int run(Options options)
+{
+    trace::Selection& selection = options.selection;
+    selectPasses(options, selection);
+    if (options.format == "text" && (!selection.signals.empty() || !selection.units.empty())) {
+        throw simulation::Error("--signals and --units need --format csv, vcd or npy: the text is the library's own");
+    }
+    if (options.format == "npy" && options.output == standardStream) {
+        throw simulation::Error("--format npy needs --output FILE");
+    }
+    const SoftBlock block = readBlock(options);
+    if (options.format == "text") {
+        trace::writeText(block, options.decoder.generics, selection, openOutput(options));
+        return success;
+    }
+    if (selection.signals.empty()) {
+        for (const char* const kind : {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"}) {
+            appendSignals(kind, selection.signals);
+        }
+    }
+    Passes passes(block, options.decoder.generics, std::cerr);
+    checkUnits(options, passes.division());
+    const auto writer = writerOf(options, passes.division());
+    for (std::uint32_t halfIteration = 0; halfIteration <= selection.last; ++halfIteration) {
+        passes.next();
+        if (halfIteration >= selection.first) {
+            writer->add(passes, halfIteration);
+        }
+    }
+    writer->finish();
+    return success;
+}
+
+constexpr char explanation[] = R"(
+FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
+interleaved constituent code. 'text' is the library's own trace; it lacks the branch metrics,
+which the other formats have. 'vcd' has a scope for each unit and thread; a unit of its time is
+a trellis step. docs/trace.md tells the rest.
+
+Signals: intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to beta7 (beta), llr,
+extrinsic. Exit status: 0 written, 2 bad input or usage.
+
+Example: waveforms of the first iteration
+  morvik trace k1024.csv --half-iterations 0:1 --format vcd --output k1024.vcd)";
+
+void addSelectionOptions(CLI::App& command, Options& options)
+{
+    command.add_option("--half-iterations", options.halfIterations, "Which passes to write, N or A:B; all without it")
+        ->type_name("A:B");
+    addListOption(
+        command, "--signals", options.selection.signals, appendSignals, "Which signals to write; all without it")
+        ->type_name("NAME[,NAME...]");
+    addListOption(command, "--units", options.selection.units, appendUnit, "Whose values to write; all without it")
+        ->type_name("N[,N...]");
+}
+
+}  // namespace
+
+Command addTrace(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("trace", "Write the values inside of chosen passes, as waveforms or tables");
+    const auto options = std::make_shared<Options>();
+    command->add_option("FILE", options->input, "Soft values, as CSV; - for standard input")
+        ->type_name("")
+        ->capture_default_str();
+    command->add_option("--block", options->block, "Which block of FILE, from 0")
+        ->transform(integerFrom(0, UINT32_MAX - 1))
+        ->type_name("N")
+        ->capture_default_str();
+    command->add_option("--output", options->output, "File for the trace; - for standard output")
+        ->type_name("FILE")
+        ->capture_default_str();
+    command->add_option("--format", options->format, "text, csv, vcd or npy")
+        ->transform(oneOf({{"text", "text"}, {"csv", "csv"}, {"vcd", "vcd"}, {"npy", "npy"}}))
+        ->type_name("FORMAT")
+        ->capture_default_str();
+    addSelectionOptions(*command, *options);
+    addDecoderOptions(*command, options->decoder);
+    command->footer(explanation);
+    const auto work = [options] {
+        return run(*options);
+    };
+    return {command, work};
+}
+
+}  // namespace morvik

@@ -1,0 +1,14 @@
+// Trace: the subcommand that writes the values inside of chosen passes.
+#ifndef MORVIK_TRACE_H
+#define MORVIK_TRACE_H
+
+#include "Command.h"
+
+namespace morvik {
+
+/// Adds `trace` to the command line.
+Command addTrace(CLI::App& app);
+
+}  // namespace morvik
+
+#endif

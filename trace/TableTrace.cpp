@@ -1,0 +1,78 @@
+// TableTrace: a trace as rows of integers, one for each trellis step.
+#include <utility>
+
+#include "TraceWriter.h"
+
+namespace morvik::trace {
+
+namespace {
+
+constexpr unsigned metricBits = 12;
+
+class TableTrace : public TraceWriter {
+public:
+    TableTrace(std::unique_ptr<vectors::TableWriter> table, std::uint32_t block, Selection selection)
+        : itsTable(std::move(table)), itsBlock(block), itsSelection(std::move(selection))
+    {
+    }
+
+    void add(const Passes& passes, std::uint32_t halfIteration) override
+    {
+        const Division& division = passes.division();
+        for (std::uint32_t step = 0; step < division.K() + tailSteps; ++step) {
+            const StepPlace place = division.placeOf(step);
+            if (!itsSelection.showsUnit(place.unit)) {
+                continue;
+            }
+            itsRow = {halfIteration,
+                      constituentCode(halfIteration),
+                      step,
+                      place.segment,
+                      place.window,
+                      place.unit,
+                      place.thread};
+            for (const unsigned signal : itsSelection.signals) {
+                itsRow.push_back(passes.isComputed(signal, step) ? passes.value(signal, step) : 0);
+            }
+            itsTable->add(itsBlock, itsRow);
+        }
+    }
+
+    void finish() override
+    {
+        itsTable->finish();
+    }
+
+private:
+    std::unique_ptr<vectors::TableWriter> itsTable;
+    std::uint32_t itsBlock;
+    Selection itsSelection;
+    vectors::Row itsRow;
+};
+
+}  // namespace
+
+vectors::Table traceTable(const Selection& selection)
+{
+    vectors::Table table = {"trace",
+                            {{"half_iteration", 5, false},
+                             {"code", 2, false},
+                             {"step", 13, false},
+                             {"segment", 5, false},
+                             {"window", 4, false},
+                             {"unit", 3, false},
+                             {"thread", 2, false}}};
+    for (const unsigned signal : selection.signals) {
+        table.columns.push_back({passSignals[signal], metricBits, true});
+    }
+    return table;
+}
+
+std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<vectors::TableWriter> table,
+                                        std::uint32_t block,
+                                        const Selection& selection)
+{
+    return std::make_unique<TableTrace>(std::move(table), block, selection);
+}
+
+}  // namespace morvik::trace
