@@ -57,21 +57,10 @@ void checkInstructionSet(const std::string& name)
     }
 }
 
-/// Throws Error if what is written to the one file, if any, would take the place of the other.
-void checkDistinct(const std::string& file, const std::string& other)
-{
-    if (!file.empty() && !other.empty() && simulation::isSamePlace(file, other)) {
-        throw simulation::Error(file + ": is the same file as " + other + ", each output needs its own");
-    }
-}
-
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
-    const Pictures pictures(options.pictures);
-    checkDistinct(options.pictures.plot, options.output);
-    checkDistinct(options.pictures.report, options.output);
-    checkDistinct(options.pictures.report, options.pictures.plot);
+    const Pictures pictures(options.pictures, options.output);
     const Interruption interruption;
     std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
@@ -88,7 +77,8 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
         isComplete = run(plan, {*workers, journal, *progress, isInterrupted, options.secondsBetweenCheckpoints});
     }
     if (!journal.ended().empty()) {
-        pictures.draw(plan, journal.ended());
+        const std::string points = std::to_string(journal.ended().size()) + " of " + std::to_string(plan.points.size());
+        pictures.draw(resultsOf(plan, journal.ended()), points);
     }
     if (isComplete) {
         return success;

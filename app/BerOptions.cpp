@@ -283,20 +283,6 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
         ->type_name("POINT:FRAME");
 }
 
-void addPictureOptions(CLI::App& command, PictureOptions& pictures)
-{
-    command.add_option("--plot", pictures.plot, "Draw the curves, as SVG, PNG or PDF by the ending .svg, .png or .pdf")
-        ->type_name("FILE");
-    command.add_option("--report", pictures.report, "Write a page for a browser: curves, table, parameters")
-        ->type_name("FILE.html");
-    command
-        .add_option("--reference",
-                    pictures.references,
-                    "Draw the error rates of a CSV file, too, such as another result; can be given several times")
-        ->type_name("FILE.csv")
-        ->allow_extra_args(false);
-}
-
 // ---- The command that repeats a run
 
 template <class Values, class Text>

@@ -3,10 +3,13 @@
 
 #include <iostream>
 #include <memory>
+#include <set>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "Pictures.h"
+#include "simulation/Error.h"
 #include "simulation/Merge.h"
 #include "simulation/ResultFiles.h"
 
@@ -17,34 +20,56 @@ namespace {
 struct Options {
     std::vector<std::string> inputs;
     std::string output;
+    PictureOptions pictures;
 };
+
+/// Writes the results as a file or, if nothing else is asked for, as CSV to standard output.
+void write(const Options& options, const simulation::Results& results)
+{
+    if (!options.output.empty()) {
+        simulation::writeResults(options.output, results);
+    } else if (!options.pictures.isAskedFor() && !(std::cout << simulation::csvText(results) << std::flush)) {
+        throw std::runtime_error("<stdout>: cannot be written");
+    }
+}
+
+std::string countOfPoints(const simulation::Results& results)
+{
+    std::set<std::size_t> numbers;
+    for (const simulation::ResultRow& row : results.rows) {
+        numbers.insert(row.pointNumber);
+    }
+    return std::to_string(numbers.size());
+}
 
 int merge(const Options& options)
 {
+    const Pictures pictures(options.pictures, options.output);
     std::vector<simulation::Part> parts;
     for (const std::string& input : options.inputs) {
         parts.push_back({input, simulation::readResults(input)});
     }
     const simulation::Results results = simulation::merge(parts);
-    if (options.output.empty()) {
-        if (!(std::cout << simulation::csvText(results) << std::flush)) {
-            throw std::runtime_error("<stdout>: cannot be written");
-        }
-        return success;
+    if (options.pictures.isAskedFor() && results.rows.empty()) {
+        throw simulation::Error("there are no points to draw");
     }
-    simulation::writeResults(options.output, results);
+    write(options, results);
+    if (!results.rows.empty()) {
+        pictures.draw(results, countOfPoints(results));
+    }
     return success;
 }
 
 /// The end of the help text.
 constexpr char explanation[] = R"(
 The runs have the same seed and were made by the same version. Rows of the same parameters
-become one, if they have no frames in common: 'morvik ber --frames' divides them.
+become one, if they have no frames in common: 'morvik ber --frames' divides them. One
+file alone is drawn as it is.
 
 Example: two halves of a simulation, made anywhere
   morvik ber --block-size 512 --ebn0 1.4 --frames 0:500000 --output a.csv
   morvik ber --block-size 512 --ebn0 1.4 --frames 500000:1000000 --output b.csv
-  morvik merge a.csv b.csv --output k512.csv)";
+  morvik merge a.csv b.csv --output k512.csv --plot k512.svg)";
 
 }  // namespace
 
@@ -54,9 +79,11 @@ Command addMerge(CLI::App& app)
     const auto options = std::make_shared<Options>();
     command->add_option("FILE", options->inputs, "Results, as CSV or JSON")->required()->type_name("");
     command
-        ->add_option(
-            "--output", options->output, "File for all of them, .csv or .json; by default CSV on standard output")
+        ->add_option("--output",
+                     options->output,
+                     "File for all of them, .csv or .json; CSV goes to standard output if nothing is named")
         ->type_name("FILE");
+    addPictureOptions(*command, options->pictures);
     command->footer(explanation);
     const auto run = [options] {
         return merge(*options);

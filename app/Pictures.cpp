@@ -1,4 +1,4 @@
-// Pictures: what `morvik ber` draws of its results.
+// Pictures: what is drawn of results: those of a run, or joined ones.
 #include "Pictures.h"
 
 #include <algorithm>
@@ -8,7 +8,8 @@
 #include "report/Page.h"
 #include "report/Plot.h"
 #include "report/Reference.h"
-#include "simulation/Results.h"
+#include "simulation/AtomicFile.h"
+#include "simulation/Error.h"
 #include "simulation/Thousandths.h"
 
 namespace morvik {
@@ -44,20 +45,40 @@ report::Row rowOf(const simulation::ResultRow& row)
     return drawn;
 }
 
-std::string rangeText(const std::vector<simulation::Point>& points)
+std::string rangeText(const std::vector<simulation::ResultRow>& rows)
 {
-    int least = points.front().milliDecibels;
-    int most = least;
-    for (const simulation::Point& point : points) {
-        least = std::min(least, point.milliDecibels);
-        most = std::max(most, point.milliDecibels);
+    const auto [least, most] = std::minmax_element(rows.begin(), rows.end(), [](const auto& a, const auto& b) {
+        return a.point.milliDecibels < b.point.milliDecibels;
+    });
+    return simulation::thousandthsText(least->point.milliDecibels) + " to " +
+           simulation::thousandthsText(most->point.milliDecibels) + " dB";
+}
+
+/// Throws Error if what is written to the one file, if any, would take the place of the other.
+void checkDistinct(const std::string& file, const std::string& other)
+{
+    if (!file.empty() && !other.empty() && simulation::isSamePlace(file, other)) {
+        throw simulation::Error(file + ": is the same file as " + other + ", each output needs its own");
     }
-    return simulation::thousandthsText(least) + " to " + simulation::thousandthsText(most) + " dB";
 }
 
 }  // namespace
 
-Pictures::Pictures(const PictureOptions& options) : itsOptions(options)
+void addPictureOptions(CLI::App& command, PictureOptions& options)
+{
+    command.add_option("--plot", options.plot, "Draw the curves, as SVG, PNG or PDF by the ending .svg, .png or .pdf")
+        ->type_name("FILE");
+    command.add_option("--report", options.report, "Write a page for a browser: curves, table, parameters")
+        ->type_name("FILE.html");
+    command
+        .add_option("--reference",
+                    options.references,
+                    "Draw the error rates of a CSV file, too, such as another result; can be given several times")
+        ->type_name("FILE.csv")
+        ->allow_extra_args(false);
+}
+
+Pictures::Pictures(const PictureOptions& options, const std::string& output) : itsOptions(options)
 {
     for (const std::string& file : options.references) {
         std::vector<report::Curve> curves = report::readReference(file);
@@ -69,12 +90,16 @@ Pictures::Pictures(const PictureOptions& options) : itsOptions(options)
     if (!options.report.empty()) {
         report::checkReport(options.report);
     }
+    checkDistinct(options.plot, output);
+    checkDistinct(options.report, output);
+    checkDistinct(options.report, options.plot);
 }
 
-void Pictures::draw(const simulation::Plan& plan, const std::vector<simulation::PointResult>& points) const
+void Pictures::draw(const simulation::Results& results, const std::string& points) const
 {
     std::vector<report::Row> rows;
-    for (const simulation::ResultRow& row : resultsOf(plan, points).rows) {
+    rows.reserve(results.rows.size());
+    for (const simulation::ResultRow& row : results.rows) {
         rows.push_back(rowOf(row));
     }
     std::vector<report::Curve> curves = curvesOf(rows);
@@ -87,11 +112,11 @@ void Pictures::draw(const simulation::Plan& plan, const std::vector<simulation::
                             curves,
                             {title,
                              {{"Channel", "BPSK over white Gaussian noise; Eb/N0 counts the tail"},
-                              {"Eb/N0", rangeText(plan.points)},
-                              {"Points", std::to_string(points.size()) + " of " + std::to_string(plan.points.size())},
-                              {"Seed", std::to_string(plan.seed)},
-                              {"Version", plan.version}},
-                             plan.command});
+                              {"Eb/N0", rangeText(results.rows)},
+                              {"Points", points},
+                              {"Seed", std::to_string(results.rows.front().seed)},
+                              {"Version", results.version}},
+                             results.command});
     }
 }
 

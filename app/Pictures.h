@@ -1,12 +1,13 @@
-// Pictures: what `morvik ber` draws of its results.
+// Pictures: what is drawn of results: those of a run, or joined ones.
 #ifndef MORVIK_PICTURES_H
 #define MORVIK_PICTURES_H
 
+#include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
 
 #include "report/Curves.h"
-#include "simulation/Plan.h"
+#include "simulation/Results.h"
 
 namespace morvik {
 
@@ -15,17 +16,26 @@ struct PictureOptions {
     std::string plot;
     std::string report;
     std::vector<std::string> references;  // files with curves to compare with
+
+    /// Whether anything is to be drawn.
+    bool isAskedFor() const
+    {
+        return !plot.empty() || !report.empty();
+    }
 };
 
-/// The pictures of one run.
+/// Adds --plot, --report and --reference, which fill in `options`.
+void addPictureOptions(CLI::App& command, PictureOptions& options);
+
+/// The pictures of some results.
 class Pictures {
 public:
-    /// Reads the references and finds out whether the files can be written, before a long run. Throws
-    /// std::runtime_error.
-    explicit Pictures(const PictureOptions& options);
+    /// Reads the references and finds out whether the files can be written, before a long run, and beside the file of
+    /// the results, if there is one. Throws std::runtime_error.
+    Pictures(const PictureOptions& options, const std::string& output);
 
-    /// Draws what has been counted. Throws std::runtime_error.
-    void draw(const simulation::Plan& plan, const std::vector<simulation::PointResult>& points) const;
+    /// Draws the results, of which there are some. `points` tells how many they are. Throws std::runtime_error.
+    void draw(const simulation::Results& results, const std::string& points) const;
 
 private:
     PictureOptions itsOptions;

@@ -1,4 +1,4 @@
-// morvik ber: the plot and the report that it leaves.
+// morvik ber and merge: the plot and the report that they leave.
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -90,6 +90,71 @@ TEST_F(BerPictures, ThatWouldTakeThePlaceOfTheResultsEndTheRunBeforeItBegins)
     expectRefusedAtOnce("--plot curves.svg", "curves.svg: is the same file as results.csv, each output needs its own");
     expectRefusedAtOnce("--report report.html",
                         "report.html: is the same file as results.csv, each output needs its own");
+}
+
+// ---- Of joined results
+
+class MergePictures : public BerPictures {
+protected:
+    /// Makes a.csv and b.csv of the halves of some frames.
+    void makeHalves() const
+    {
+        const Arguments run = words("--block-size 40 --ebn0 0,2 --seed 7 --frames");
+        berFile(run + Arguments{"0:100"}, "a.csv");
+        berFile(run + Arguments{"100:300"}, "b.csv");
+    }
+
+    /// Runs `morvik merge`, and expects that it succeeds. Returns what it printed.
+    std::string merge(const std::string& arguments) const
+    {
+        const CommandResult result = morvik.run(words("merge " + arguments));
+        EXPECT_EQ(result.status, 0) << result.err;
+        EXPECT_EQ(result.err, "");
+        return result.out;
+    }
+};
+
+TEST_F(MergePictures, ShowTheSumsAndTheReferences)
+{
+    makeHalves();
+    morvik.write("other.csv", "# title: another decoder\nebn0_db,ber,fer\n0,1e-1,5e-1\n1,1e-2,1e-1\n");
+    merge("a.csv b.csv --output all.csv --plot all.svg --report all.html --reference other.csv");
+    for (const char* file : {"all.svg", "all.html"}) {
+        SCOPED_TRACE(file);
+        EXPECT_NE(morvik.read(file).find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
+        EXPECT_NE(morvik.read(file).find("another decoder"), std::string::npos);
+    }
+    const std::string page = withoutTags(morvik.read("all.html"));
+    const std::vector<CsvRow> rows = csvRows(morvik.read("all.csv"));
+    ASSERT_EQ(rows.size(), 2U);
+    for (const CsvRow& row : rows) {
+        EXPECT_EQ(row.at("blocks"), "300");
+        EXPECT_NE(page.find(row.at("block_errors")), std::string::npos) << row.at("block_errors");
+    }
+    EXPECT_NE(page.find("morvik merge a.csv b.csv"), std::string::npos);
+    EXPECT_NE(page.find("Points2\nSeed7\n"), std::string::npos) << page;
+}
+
+TEST_F(MergePictures, AreAllThatIsMadeIfNoOutputIsNamed)
+{
+    makeHalves();
+    EXPECT_EQ(merge("a.csv --plot a.svg"), "") << "of one file, too";
+    EXPECT_EQ(morvik.names(), words("a.csv a.svg b.csv"));
+}
+
+TEST_F(MergePictures, ThatCannotBeMadeAreRefusedBeforeAnythingIsWritten)
+{
+    makeHalves();
+    const auto expectNothingWritten = [this](const std::string& options, const std::string& line) {
+        expectRefused(words("merge a.csv b.csv --output all.csv " + options), "morvik merge: " + line);
+        EXPECT_EQ(morvik.names(), words("a.csv b.csv"));
+    };
+    expectNothingWritten("--plot all.gif",
+                         "all.gif: a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
+    expectNothingWritten("--report all.csv", "all.csv: is no name for a report, allowed are names that end in .html");
+    expectNothingWritten("--reference none.csv", "none.csv: cannot be opened: No such file or directory");
+    morvik.write("empty.csv", morvik.read("a.csv").substr(0, morvik.read("a.csv").find('\n') + 1));
+    expectRefused(words("merge empty.csv --plot all.svg"), "morvik merge: there are no points to draw");
 }
 
 }  // namespace
