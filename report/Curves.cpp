@@ -1,7 +1,11 @@
-// Curves: error rates against Eb/N0, as they are drawn and tabulated.
+// Curves: error rates against Eb/N0 and against iterations, as they are drawn and tabulated.
 #include "Curves.h"
 
 #include <algorithm>
+#include <map>
+#include <utility>
+
+#include "Wording.h"
 
 namespace report {
 
@@ -38,9 +42,12 @@ std::vector<Curve> curvesOf(const std::vector<Row>& rows)
         auto curve =
             std::find_if(curves.begin(), curves.end(), [&title](const Curve& other) { return other.title == title; });
         if (curve == curves.end()) {
-            curve = curves.insert(curves.end(), Curve{title, false, {}});
+            Setting others = row.setting;
+            others.iterations = 0;
+            curve = curves.insert(curves.end(), Curve{title, false, {}, titleOf(others)});
         }
         curve->samples.push_back(row.sample);
+        curve->samples.back().iterations = row.setting.iterations;
     }
     for (Curve& curve : curves) {
         std::stable_sort(curve.samples.begin(), curve.samples.end(), [](const Sample& a, const Sample& b) {
@@ -48,6 +55,36 @@ std::vector<Curve> curvesOf(const std::vector<Row>& rows)
         });
     }
     return curves;
+}
+
+std::vector<Curve> againstIterations(const std::vector<Curve>& curves)
+{
+    std::map<std::pair<std::size_t, double>, Curve> found;  // by the first curve of the family, and Eb/N0
+    for (const Curve& curve : curves) {
+        const auto first = std::find_if(curves.begin(), curves.end(), [&curve](const Curve& other) {
+            return other.family == curve.family && other.reference == curve.reference;
+        });
+        for (const Sample& sample : curve.samples) {
+            if (sample.iterations != 0) {
+                Curve& across = found[{static_cast<std::size_t>(first - curves.begin()), sample.ebn0}];
+                const std::string separator = curve.family.empty() ? "" : ", ";
+                across.title = curve.family + separator + decibels(sample.ebn0) + " dB";
+                across.family = curve.family;
+                across.reference = curve.reference;
+                across.samples.push_back(sample);
+            }
+        }
+    }
+    std::vector<Curve> result;
+    for (auto& [place, curve] : found) {
+        std::stable_sort(curve.samples.begin(), curve.samples.end(), [](const Sample& a, const Sample& b) {
+            return a.iterations < b.iterations;
+        });
+        if (curve.samples.front().iterations < curve.samples.back().iterations) {
+            result.push_back(std::move(curve));
+        }
+    }
+    return result;
 }
 
 }  // namespace report

@@ -1,7 +1,8 @@
-// Curves: error rates against Eb/N0, as they are drawn and tabulated.
+// Curves: error rates against Eb/N0 and against iterations, as they are drawn and tabulated.
 #ifndef MORVIK_REPORT_CURVES_H
 #define MORVIK_REPORT_CURVES_H
 
+#include <cstddef>
 #include <cstdint>
 #include <limits>
 #include <string>
@@ -33,6 +34,8 @@ struct Sample {
     std::uint64_t blockErrors = 0;
 
     double clipped = unknown;  // the fraction of the soft values that were clipped
+    unsigned iterations = 0;   // after which this was counted; 0 where it is not known
+    std::size_t row = 0;       // where it is tabulated
 };
 
 /// A series of the plot.
@@ -40,6 +43,7 @@ struct Curve {
     std::string title;
     bool reference = false;  // to compare with: drawn dashed, after the others in the legend
     std::vector<Sample> samples;
+    std::string family = "";  // the title that it shares with the curves that differ in one number alone, which ascends
 };
 
 /// What a point was simulated with. Zero and the empty text stand for what is not known.
@@ -59,7 +63,12 @@ struct Row {
 
 /// The curves that the rows belong to, in the order of their first rows; samples are put in the order of Eb/N0. Rows of
 /// one curve have the same setting, which is its title: "K = 512, 8 units, scaled, 6 iterations".
+/// Those that differ in their iterations alone are a family.
 std::vector<Curve> curvesOf(const std::vector<Row>& rows);
+
+/// The same samples against iterations: a curve for each family and Eb/N0 at which there are several of them. Those
+/// that differ in Eb/N0 alone are a family.
+std::vector<Curve> againstIterations(const std::vector<Curve>& curves);
 
 }  // namespace report
 

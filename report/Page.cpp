@@ -51,17 +51,14 @@ std::string clippedText(const Sample& sample)
     return std::isfinite(sample.clipped) ? report::rate(sample.clipped) : noFigure;
 }
 
-std::string rowName(std::size_t curve, std::size_t sample)
+std::string rowName(const Sample& sample)
 {
-    return "p" + std::to_string(curve) + "-" + std::to_string(sample);
+    return "p" + std::to_string(sample.row);
 }
 
-std::string colourName(const std::vector<Curve>& curves, std::size_t curve)
+std::string colourName(const View& view, std::size_t curve)
 {
-    const Look look = lookOf(curves, curve);
-    const auto colour = std::find_if(
-        colours.begin(), colours.end(), [&look](const Colour& other) { return other.onLight == look.colour.onLight; });
-    return colour == colours.end() ? "reference" : "series-" + std::to_string(colour - colours.begin());
+    return view.axis->name + ("-" + std::to_string(curve));
 }
 
 // ---- Data for the script
@@ -110,39 +107,70 @@ std::string countsJson(const Sample& sample)
     return '[' + text + ']';
 }
 
-std::string dataJson(const std::vector<Curve>& curves)
+/// What is drawn of a curve; samples are named by their rows.
+std::string curveJson(const View& view, std::size_t index)
 {
-    std::string text = "[";
-    for (std::size_t i = 0; i < curves.size(); ++i) {
-        const Look look = lookOf(curves, i);
-        text += (i > 0 ? ",\n" : "\n") + std::string("{\"index\":") + std::to_string(i) +
-                ",\"title\":" + json(curves[i].title) + ",\"reference\":" + (curves[i].reference ? "true" : "false") +
-                ",\"colour\":" + json(colourName(curves, i)) + ",\"marker\":" + std::to_string(look.marker) +
-                ",\"dash\":" + std::to_string(look.dash) + ",\"layer\":" + std::to_string(look.layer) +
-                ",\"samples\":[";
-        for (std::size_t j = 0; j < curves[i].samples.size(); ++j) {
-            const Sample& sample = curves[i].samples[j];
-            text += (j > 0 ? ",\n" : "\n") + std::string("{\"row\":") + json(rowName(i, j)) +
-                    ",\"ebn0\":" + json(sample.ebn0) + ",\"place\":" + json(decibels(sample.ebn0)) +
-                    ",\"ber\":" + json(bitErrorRate.of(sample)) + ",\"bler\":" + json(blockErrorRate.of(sample)) +
-                    ",\"counts\":" + countsJson(sample) + '}';
+    const Curve& curve = view.curves[index];
+    const Look look = lookOf(view.curves, index, *view.axis);
+    std::string text = "{\"index\":" + std::to_string(index) + ",\"title\":" + json(curve.title) +
+                       ",\"reference\":" + (curve.reference ? "true" : "false") +
+                       ",\"colour\":" + json(colourName(view, index)) + ",\"marker\":" + std::to_string(look.marker) +
+                       ",\"dash\":" + std::to_string(look.dash) + ",\"layer\":" + std::to_string(look.layer) +
+                       ",\"samples\":[";
+    const char* separator = "";
+    for (const Sample& sample : curve.samples) {
+        text += separator + std::to_string(sample.row);
+        separator = ",";
+    }
+    return text + "]}";
+}
+
+std::string rowJson(const Sample& sample)
+{
+    return "{\"row\":" + json(rowName(sample)) + ",\"ebn0\":" + json(sample.ebn0) +
+           ",\"place\":" + json(decibels(sample.ebn0)) + ",\"iterations\":" + std::to_string(sample.iterations) +
+           ",\"ber\":" + json(bitErrorRate.of(sample)) + ",\"bler\":" + json(blockErrorRate.of(sample)) +
+           ",\"counts\":" + countsJson(sample) + '}';
+}
+
+/// The samples in the order of their rows, and the views.
+std::string dataJson(const std::vector<View>& views)
+{
+    std::string text = "{\"rows\":[";
+    const char* separator = "\n";
+    for (const Curve& curve : views[0].curves) {
+        for (const Sample& sample : curve.samples) {
+            text += separator + rowJson(sample);
+            separator = ",\n";
+        }
+    }
+    text += "],\n\"views\":[";
+    separator = "\n";
+    for (const View& view : views) {
+        text += separator + ("{\"axis\":" + json(std::string(view.axis->name))) + ",\"curves\":[";
+        separator = "\n";
+        for (std::size_t i = 0; i < view.curves.size(); ++i) {
+            text += separator + curveJson(view, i);
+            separator = ",\n";
         }
         text += "]}";
+        separator = ",\n";
     }
-    return text + "\n]";
+    return text + "]}";
 }
 
 // ---- The page
 
-std::string style()
+std::string style(const std::vector<View>& views)
 {
     std::ostringstream text;
     text.imbue(std::locale::classic());
-    const auto write = [&text](const char* Colour::*side) {
-        for (std::size_t i = 0; i < colours.size(); ++i) {
-            text << " --series-" << i << ": " << colours[i].*side << ';';
+    const auto write = [&](std::string Colour::*side) {
+        for (const View& view : views) {
+            for (std::size_t i = 0; i < view.curves.size(); ++i) {
+                text << " --" << colourName(view, i) << ": " << lookOf(view.curves, i, *view.axis).colour.*side << ';';
+            }
         }
-        text << " --reference: " << referenceColour.*side << ';';
     };
     text << ":root {";
     write(&Colour::onLight);
@@ -153,13 +181,13 @@ std::string style()
 }
 
 /// Nothing may be loaded from anywhere.
-std::string head(const std::string& title)
+std::string head(const std::string& title, const std::vector<View>& views)
 {
     return "<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n<meta charset=\"utf-8\">\n"
            "<meta http-equiv=\"Content-Security-Policy\" content=\"default-src 'none'; style-src 'unsafe-inline'; "
            "script-src 'unsafe-inline'; base-uri 'none'; form-action 'none'\">\n"
            "<meta name=\"viewport\" content=\"width=device-width, initial-scale=1\">\n<title>" +
-           escaped(title) + "</title>\n<style>\n" + style() + "</style>\n</head>\n";
+           escaped(title) + "</title>\n<style>\n" + style(views) + "</style>\n</head>\n";
 }
 
 /// "3 curves and 2 references, 40 points".
@@ -178,14 +206,23 @@ std::string lead(const std::vector<Curve>& curves)
            (references > 0 ? " and " + counted(references, "reference") : "") + ", " + counted(points, "point");
 }
 
-constexpr char figure[] = R"(<section id="figure" aria-labelledby="figure-title">
+constexpr char figureStart[] = R"(<section id="figure" aria-labelledby="figure-title">
 <h2 id="figure-title" class="unseen">Curves</h2>
 <div class="controls">
 <fieldset><legend>Show</legend>
 <label class="choice"><input type="radio" name="quantity" value="ber" autocomplete="off" checked><span>BER</span></label>
 <label class="choice"><input type="radio" name="quantity" value="bler" autocomplete="off"><span>BLER</span></label>
 </fieldset>
-<label class="check"><input type="checkbox" id="bars" autocomplete="off" checked>95 % confidence</label>
+)";
+
+constexpr char axisChoice[] = R"(<fieldset><legend>Against</legend>
+<label class="choice"><input type="radio" name="axis" value="ebn0" autocomplete="off"><span>Eb/N0</span></label>
+<label class="choice"><input type="radio" name="axis" value="iterations" autocomplete="off"><span>Iterations</span></label>
+</fieldset>
+)";
+
+constexpr char figureEnd[] =
+    R"(<label class="check"><input type="checkbox" id="bars" autocomplete="off" checked>95 % confidence</label>
 <p class="hint">Point at the curves, or use the arrow keys</p>
 </div>
 <div id="chart" tabindex="0" role="group" aria-label="Chart; the arrow keys go from point to point">
@@ -205,12 +242,12 @@ bool hasClipped(const std::vector<Curve>& curves)
     });
 }
 
-void writeRow(std::ostream& page, const Sample& sample, const std::string& name, bool withClipped)
+void writeRow(std::ostream& page, const Sample& sample, bool withClipped)
 {
     const auto cell = [&page](const std::string& content) {
         page << "<td>" << content << "</td>";
     };
-    page << "<tr id=\"" << name << "\">";
+    page << "<tr id=\"" << rowName(sample) << "\">";
     cell(decibels(sample.ebn0));
     for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
         cell(escaped(rateText(quantity->of(sample))));
@@ -225,8 +262,9 @@ void writeRow(std::ostream& page, const Sample& sample, const std::string& name,
     page << "</tr>\n";
 }
 
-void writePoints(std::ostream& page, const std::vector<Curve>& curves)
+void writePoints(std::ostream& page, const View& view)
 {
+    const std::vector<Curve>& curves = view.curves;
     const bool withClipped = hasClipped(curves);
     page << "<section>\n<h2 id=\"points\">All points</h2>\n<div class=\"scroll\">\n"
             "<table class=\"points\" aria-labelledby=\"points\">\n<thead><tr><th "
@@ -238,10 +276,10 @@ void writePoints(std::ostream& page, const std::vector<Curve>& curves)
     for (std::size_t i = 0; i < curves.size(); ++i) {
         page << "<tbody" << (curves[i].reference ? " class=\"reference\"" : "")
              << ">\n<tr><th scope=\"rowgroup\" colspan=\"" << (withClipped ? 9 : 8)
-             << "\"><span class=\"swatch\" style=\"border-color: var(--" << colourName(curves, i) << ")\"></span>"
+             << "\"><span class=\"swatch\" style=\"border-color: var(--" << colourName(view, i) << ")\"></span>"
              << escaped(curves[i].title) << (curves[i].reference ? " <small>reference</small>" : "") << "</th></tr>\n";
-        for (std::size_t j = 0; j < curves[i].samples.size(); ++j) {
-            writeRow(page, curves[i].samples[j], rowName(i, j), withClipped);
+        for (const Sample& sample : curves[i].samples) {
+            writeRow(page, sample, withClipped);
         }
         page << "</tbody>\n";
     }
@@ -274,6 +312,19 @@ void writeRun(std::ostream& page, const RunDescription& run)
     }
 }
 
+/// The curves in order, with each sample's row of the table.
+std::vector<Curve> numbered(const std::vector<Curve>& curves)
+{
+    std::vector<Curve> result = inOrder(curves);
+    std::size_t row = 0;
+    for (Curve& curve : result) {
+        for (Sample& sample : curve.samples) {
+            sample.row = row++;
+        }
+    }
+    return result;
+}
+
 }  // namespace
 
 void checkReport(const std::string& fileName)
@@ -286,18 +337,18 @@ void checkReport(const std::string& fileName)
 
 void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run)
 {
-    const std::vector<Curve> ordered = inOrder(curves);
+    const std::vector<View> views = viewsOf(numbered(curves));
     std::ostringstream page;
     page.imbue(std::locale::classic());
-    page << head(run.title) << "<body>\n<main>\n<h1>" << escaped(run.title) << "</h1>\n<p class=\"lead\">"
-         << lead(ordered) << "</p>\n"
-         << figure;
-    writePoints(page, ordered);
+    page << head(run.title, views) << "<body>\n<main>\n<h1>" << escaped(run.title) << "</h1>\n<p class=\"lead\">"
+         << lead(curves) << "</p>\n"
+         << figureStart << (views.size() > 1 ? axisChoice : "") << figureEnd;
+    writePoints(page, views[0]);
     writeRun(page, run);
     page << "<footer>Rates are given with their 95 % confidence intervals. Where no error was seen, the rate is below "
             "the bound that is given; the chart shows it as an open triangle with an arrow.</footer>\n</main>\n"
             "<script type=\"application/json\" id=\"data\">"
-         << dataJson(ordered) << "</script>\n<script>\n"
+         << dataJson(views) << "</script>\n<script>\n"
          << pageScript << "</script>\n</body>\n</html>\n";
     simulation::writeAtomically(fileName, page.str());
 }

@@ -61,8 +61,10 @@ std::string draw(const std::string& fileName, const std::string& script)
 /// What those read who do not see the picture.
 std::string description(const std::vector<Curve>& curves)
 {
-    std::string text = "Bit and block error rates against Eb/N0, on a logarithmic scale. Series: ";
-    const std::vector<Curve> ordered = inOrder(curves);
+    const std::vector<View> views = viewsOf(curves);
+    const std::string both = views.size() > 1 ? " and against iterations" : "";
+    std::string text = "Bit and block error rates against Eb/N0" + both + ", on a logarithmic scale. Series: ";
+    const std::vector<Curve>& ordered = views[0].curves;
     for (std::size_t i = 0; i < ordered.size(); ++i) {
         text += (i == 0 ? "" : "; ") + ordered[i].title + (ordered[i].reference ? " (reference)" : "");
     }

@@ -57,71 +57,112 @@ Measures measuresOf(const std::string& suffix)
     return suffix == ".svg" ? Measures{1, 0.85} : Measures{0.75, 1};
 }
 
+std::string legendTitle(const Curve& curve)
+{
+    return shortened(printable(curve.title), longestEntry);
+}
+
+bool isDrawn(const std::vector<Curve>& curves, const Quantity& quantity)
+{
+    return std::any_of(curves.begin(), curves.end(), [&quantity](const Curve& curve) {
+        return std::any_of(curve.samples.begin(), curve.samples.end(), [&quantity](const Sample& sample) {
+            return quantity.of(sample).canBeDrawn();
+        });
+    });
+}
+
+/// A row of the picture: the panels of a view, and their legend.
+struct Band {
+    Band(const View& view, int place) : name(view.axis->name), axis(*view.axis), curves(view.curves), top(place)
+    {
+        for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
+            if (isDrawn(curves, *quantity)) {
+                quantities.push_back(quantity);
+            }
+        }
+        if (quantities.empty()) {
+            quantities = {&bitErrorRate, &blockErrorRate};
+        }
+        for (std::size_t i = 0; i < curves.size(); ++i) {
+            looks.push_back(lookOf(curves, i, axis));
+            const auto length = static_cast<int>(characters(legendTitle(curves[i])));
+            entryWidth = std::max(entryWidth, legendSample + characterWidth * length);
+        }
+    }
+
+    int legendRows() const
+    {
+        const int columns = std::clamp(width / entryWidth, 1, 4);
+        return std::max(1, (static_cast<int>(curves.size()) + columns - 1) / columns);
+    }
+
+    int legendTop() const
+    {
+        return top + panelHeight + axisHeight;
+    }
+
+    int bottom() const
+    {
+        return legendTop() + legendRowHeight * legendRows();
+    }
+
+    std::string name;
+    const Axis& axis;
+    std::vector<Curve> curves;
+    std::vector<Look> looks;
+    std::vector<const Quantity*> quantities;
+    int entryWidth = legendSample;  // of the legend
+    int top;                        // of the panels
+};
+
+/// Whether some curve of the view has a line.
+bool hasLines(const View& view)
+{
+    return std::any_of(view.curves.begin(), view.curves.end(), [](const Curve& curve) {
+        return !curve.reference && curve.samples.size() > 1;
+    });
+}
+
 class Script {
 public:
     Script(const std::vector<Curve>& curves, const std::string& title, const Measures& measures)
-        : itsCurves(inOrder(curves)), itsTitle(shortened(printable(title), longestTitle)), itsMeasures(measures)
+        : itsTitle(shortened(printable(title), longestTitle)), itsMeasures(measures)
     {
         itsText.imbue(std::locale::classic());
-        for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
-            if (isDrawn(*quantity)) {
-                itsQuantities.push_back(quantity);
+        const std::vector<View> views = viewsOf(curves);
+        for (const View& view : views) {
+            if (views.size() == 1 || hasLines(view)) {  // at one Eb/N0 it is the iterations that show something
+                itsBands.emplace_back(view, (itsBands.empty() ? 0 : itsBands.back().bottom()) + headerHeight);
             }
-        }
-        if (itsQuantities.empty()) {
-            itsQuantities = {&bitErrorRate, &blockErrorRate};
-        }
-        for (std::size_t i = 0; i < itsCurves.size(); ++i) {
-            itsLooks.push_back(lookOf(itsCurves, i));
-            const auto length = static_cast<int>(characters(legendTitle(itsCurves[i])));
-            itsEntryWidth = std::max(itsEntryWidth, legendSample + characterWidth * length);
         }
     }
 
     int height() const
     {
-        return headerHeight + panelHeight + axisHeight + legendHeight() + noteHeight;
+        return itsBands.back().bottom() + noteHeight;
     }
 
     std::string text()
     {
-        writeData();
-        writeFrame();
-        const auto count = static_cast<int>(itsQuantities.size());
-        for (int i = 0; i < count; ++i) {
-            writePanel(*itsQuantities[static_cast<std::size_t>(i)], width * i / count, width * (i + 1) / count);
+        for (const Band& band : itsBands) {
+            writeData(band);
         }
-        writeLegend();
+        itsText << "set multiplot\n";
+        writeTitle();
+        for (const Band& band : itsBands) {
+            writeFrame();
+            const auto count = static_cast<int>(band.quantities.size());
+            for (int i = 0; i < count; ++i) {
+                writePanel(
+                    band, *band.quantities[static_cast<std::size_t>(i)], width * i / count, width * (i + 1) / count);
+            }
+            writeLegend(band);
+        }
         itsText << "unset multiplot\n";
         return itsText.str();
     }
 
 private:
-    bool isDrawn(const Quantity& quantity) const
-    {
-        return std::any_of(itsCurves.begin(), itsCurves.end(), [&quantity](const Curve& curve) {
-            return std::any_of(curve.samples.begin(), curve.samples.end(), [&quantity](const Sample& sample) {
-                return quantity.of(sample).canBeDrawn();
-            });
-        });
-    }
-
-    int legendRows() const
-    {
-        const int columns = std::clamp(width / itsEntryWidth, 1, 4);
-        return std::max(1, (static_cast<int>(itsCurves.size()) + columns - 1) / columns);
-    }
-
-    int legendHeight() const
-    {
-        return legendRowHeight * legendRows();
-    }
-
-    static std::string legendTitle(const Curve& curve)
-    {
-        return shortened(printable(curve.title), longestEntry);
-    }
-
     /// A place of the picture, counted from its upper left corner, as gnuplot counts: fractions, from below.
     std::string at(int x, int y) const
     {
@@ -144,52 +185,53 @@ private:
     }
 
     /// The blocks that the plot commands refer to.
-    static std::string lineData(const Quantity& quantity, std::size_t curve)
+    static std::string lineData(const Band& band, const Quantity& quantity, std::size_t curve)
     {
-        return std::string("$") + quantity.name + "_" + std::to_string(curve);
+        return "$" + band.name + "_" + quantity.name + "_" + std::to_string(curve);
     }
 
-    static std::string barData(const Quantity& quantity, std::size_t curve)
+    static std::string barData(const Band& band, const Quantity& quantity, std::size_t curve)
     {
-        return lineData(quantity, curve) + "_bars";
+        return lineData(band, quantity, curve) + "_bars";
     }
 
-    static std::string boundData(const Quantity& quantity, std::size_t curve)
+    static std::string boundData(const Band& band, const Quantity& quantity, std::size_t curve)
     {
-        return lineData(quantity, curve) + "_bounds";
+        return lineData(band, quantity, curve) + "_bounds";
     }
 
-    void writeData()
+    void writeData(const Band& band)
     {
-        for (const Quantity* quantity : itsQuantities) {
-            for (std::size_t i = 0; i < itsCurves.size(); ++i) {
-                writeData(*quantity, i);
+        for (const Quantity* quantity : band.quantities) {
+            for (std::size_t i = 0; i < band.curves.size(); ++i) {
+                writeData(band, *quantity, i);
             }
         }
     }
 
-    void writeData(const Quantity& quantity, std::size_t curve)
+    void writeData(const Band& band, const Quantity& quantity, std::size_t curve)
     {
-        const double least = rateRange(quantity).from;  // zero has no place
+        const double least = rateRange(band, quantity).from;  // zero has no place
         std::string lines;
         std::string bars;
         std::string bounds;
-        for (const Sample& sample : itsCurves[curve].samples) {
+        for (const Sample& sample : band.curves[curve].samples) {
             const Rate rate = quantity.of(sample);
-            if (!rate.canBeDrawn() || !std::isfinite(sample.ebn0)) {
+            const double x = band.axis.of(sample);
+            if (!rate.canBeDrawn() || !std::isfinite(x)) {
                 continue;
             }
-            const std::string place = exact(sample.ebn0) + ' ' + exact(rate.below ? rate.high : rate.value);
+            const std::string place = exact(x) + ' ' + exact(rate.below ? rate.high : rate.value);
             (rate.below ? bounds : lines) += place + '\n';
             if (!rate.below && rate.hasInterval()) {
-                bars += exact(sample.ebn0) + ' ' + exact(std::max(rate.low, least)) + ' ' + exact(rate.high) + '\n';
+                bars += exact(x) + ' ' + exact(std::max(rate.low, least)) + ' ' + exact(rate.high) + '\n';
             }
         }
         itsHasBars = itsHasBars || !bars.empty();
         itsHasBounds = itsHasBounds || !bounds.empty();
-        writeBlock(lineData(quantity, curve), lines);
-        writeBlock(barData(quantity, curve), bars);
-        writeBlock(boundData(quantity, curve), bounds);
+        writeBlock(lineData(band, quantity, curve), lines);
+        writeBlock(barData(band, quantity, curve), bars);
+        writeBlock(boundData(band, quantity, curve), bounds);
     }
 
     void writeBlock(const std::string& name, const std::string& rows)
@@ -205,14 +247,15 @@ private:
         return std::find(itsBlocks.begin(), itsBlocks.end(), name) != itsBlocks.end();
     }
 
-    Range ebn0Range() const
+    static Range axisRange(const Band& band)
     {
         Range range{HUGE_VAL, -HUGE_VAL};
-        for (const Quantity* quantity : itsQuantities) {
-            for (const Curve& curve : itsCurves) {
+        for (const Quantity* quantity : band.quantities) {
+            for (const Curve& curve : band.curves) {
                 for (const Sample& sample : curve.samples) {
-                    if (quantity->of(sample).canBeDrawn() && std::isfinite(sample.ebn0)) {
-                        range = {std::min(range.from, sample.ebn0), std::max(range.to, sample.ebn0)};
+                    const double x = band.axis.of(sample);
+                    if (quantity->of(sample).canBeDrawn() && std::isfinite(x)) {
+                        range = {std::min(range.from, x), std::max(range.to, x)};
                     }
                 }
             }
@@ -225,10 +268,10 @@ private:
     }
 
     /// Whole decades, one at least, up to 1.
-    Range rateRange(const Quantity& quantity) const
+    static Range rateRange(const Band& band, const Quantity& quantity)
     {
         double least = 0.5;
-        for (const Curve& curve : itsCurves) {
+        for (const Curve& curve : band.curves) {
             for (const Sample& sample : curve.samples) {
                 const Rate rate = quantity.of(sample);
                 if (rate.canBeDrawn()) {
@@ -240,117 +283,120 @@ private:
         return {std::pow(10.0, std::floor(std::log10(least))), 1};
     }
 
-    void writeFrame()
+    void writeTitle()
     {
-        itsText << "set multiplot\n"
-                << "set style line 1 lc rgb '#d4d4d4' lw 0.8\n"
-                << "set style line 2 lc rgb '#efefef' lw 0.6\n"
-                << "set grid xtics ytics mytics ls 1, ls 2\n"
-                << "set border 3 lc rgb '#888888' lw 1\n"
-                << "set tics nomirror out scale 0.6,0.3 textcolor rgb '" << ink << "'\n"
-                << "set label 1 " << quoted(itsTitle) << " at " << at(leftMargin, 24) << " left noenhanced" << font(16)
+        itsText << "set label 1 " << quoted(itsTitle) << " at " << at(leftMargin, 24) << " left noenhanced" << font(16)
                 << " textcolor rgb '" << ink << "'\n";
     }
 
-    void writePanel(const Quantity& quantity, int left, int right)
+    void writeFrame()
     {
-        const Range x = ebn0Range();
-        const Range y = rateRange(quantity);
+        itsText << "set style line 1 lc rgb '#d4d4d4' lw 0.8\n"
+                << "set style line 2 lc rgb '#efefef' lw 0.6\n"
+                << "set grid xtics ytics mytics ls 1, ls 2\n"
+                << "set border 3 lc rgb '#888888' lw 1\n"
+                << "set tics nomirror out scale 0.6,0.3 textcolor rgb '" << ink << "'\n";
+    }
+
+    void writePanel(const Band& band, const Quantity& quantity, int left, int right)
+    {
+        const Range x = axisRange(band);
+        const Range y = rateRange(band, quantity);
         itsText << "set lmargin at screen " << across(left + leftMargin) << '\n'
                 << "set rmargin at screen " << across(right - rightMargin) << '\n'
-                << "set tmargin at screen " << up(headerHeight) << '\n'
-                << "set bmargin at screen " << up(headerHeight + panelHeight) << '\n'
+                << "set tmargin at screen " << up(band.top) << '\n'
+                << "set bmargin at screen " << up(band.top + panelHeight) << '\n'
                 << "set xrange [" << exact(x.from) << ':' << exact(x.to) << "]\n"
                 << "set yrange [" << exact(y.from) << ':' << exact(y.to) << "]\n"
                 << "set logscale y\nset mytics 10\nset format y '10^{%T}'\nset format x '%g'\n"
-                << "set label 3 'E_b/N_0 (dB)' at "
-                << at((left + leftMargin + right - rightMargin) / 2, headerHeight + panelHeight + 46)
+                << "set xtics nomirror " << (band.axis.isWhole ? "1" : "autofreq") << "\nset ytics nomirror\n"
+                << "set label 3 '" << band.axis.label << "' at "
+                << at((left + leftMargin + right - rightMargin) / 2, band.top + panelHeight + 46)
                 << " center textcolor rgb '" << ink << "'\n"
                 << "set label 2 '" << quantity.title << " (" << quantity.name << ")' at "
-                << at(left + leftMargin, headerHeight - 16) << " left textcolor rgb '" << faintInk << "'\n"
+                << at(left + leftMargin, band.top - 16) << " left textcolor rgb '" << faintInk << "'\n"
                 << "plot NaN notitle";
         for (const bool reference : {true, false}) {
-            for (std::size_t i = 0; i < itsCurves.size(); ++i) {
-                if (itsCurves[i].reference == reference) {
-                    writeCurve(quantity, i);
+            for (std::size_t i = 0; i < band.curves.size(); ++i) {
+                if (band.curves[i].reference == reference) {
+                    writeCurve(band, quantity, i);
                 }
             }
         }
         itsText << "\nunset label 1\n";  // it is drawn with the first panel
     }
 
-    std::string colourOf(std::size_t curve) const
+    static std::string colourOf(const Band& band, std::size_t curve)
     {
-        return std::string(" lc rgb '") + itsLooks[curve].colour.onLight + "'";
+        return std::string(" lc rgb '") + band.looks[curve].colour.onLight + "'";
     }
 
-    std::string lineStyle(std::size_t curve) const
+    static std::string lineStyle(const Band& band, std::size_t curve)
     {
-        const double lineWidth =
-            itsCurves[curve].reference ? 1.5 : 2 + 2.0 * static_cast<double>(itsLooks[curve].layer);
-        return colourOf(curve) + " lw " + exact(lineWidth) + " dt " + dashType(itsLooks[curve].dash);
+        const Look& look = band.looks[curve];
+        const double lineWidth = band.curves[curve].reference ? 1.5 : 2 + 2.0 * static_cast<double>(look.layer);
+        return colourOf(band, curve) + " lw " + exact(lineWidth) + " dt " + dashType(look.dash);
     }
 
-    std::string pointStyle(std::size_t curve) const
+    std::string pointStyle(const Band& band, std::size_t curve) const
     {
         const int open[markers] = {6, 4, 8, 12, 14};  // the next number is the filled one
-        const int marker = open[itsLooks[curve].marker] + (itsCurves[curve].reference ? 0 : 1);
-        const double size = itsMeasures.point * (0.8 + 0.35 * static_cast<double>(itsLooks[curve].layer));
-        return colourOf(curve) + " lw 1.5 ps " + exact(size) + " pt " + std::to_string(marker);
+        const int marker = open[band.looks[curve].marker] + (band.curves[curve].reference ? 0 : 1);
+        const double size = itsMeasures.point * (0.8 + 0.35 * static_cast<double>(band.looks[curve].layer));
+        return colourOf(band, curve) + " lw 1.5 ps " + exact(size) + " pt " + std::to_string(marker);
     }
 
-    void writeCurve(const Quantity& quantity, std::size_t curve)
+    void writeCurve(const Band& band, const Quantity& quantity, std::size_t curve)
     {
-        const std::string bars = barData(quantity, curve);
-        const std::string line = lineData(quantity, curve);
-        const std::string bounds = boundData(quantity, curve);
+        const std::string bars = barData(band, quantity, curve);
+        const std::string line = lineData(band, quantity, curve);
+        const std::string bounds = boundData(band, quantity, curve);
         if (hasBlock(bars)) {
             itsText << ", " << bars << " using 1:2:(0):($3-$2) with vectors heads size screen 0.003,90 lw 1.2"
-                    << colourOf(curve) << " notitle";
+                    << colourOf(band, curve) << " notitle";
         }
         if (hasBlock(line)) {
-            itsText << ", " << line << " with lines" << lineStyle(curve) << " notitle, " << line << " with points"
-                    << pointStyle(curve) << " notitle";
+            itsText << ", " << line << " with lines" << lineStyle(band, curve) << " notitle, " << line << " with points"
+                    << pointStyle(band, curve) << " notitle";
         }
         if (hasBlock(bounds)) {
             itsText << ", " << bounds << " using 1:2:(0):(" << arrowLength - 1
-                    << "*$2) with vectors head filled size screen 0.006,20 lw 1.2" << colourOf(curve) << " notitle, "
-                    << bounds << " with points pt 10 lw 1.4 ps " << 1.1 * itsMeasures.point << colourOf(curve)
-                    << " notitle";
+                    << "*$2) with vectors head filled size screen 0.006,20 lw 1.2" << colourOf(band, curve)
+                    << " notitle, " << bounds << " with points pt 10 lw 1.4 ps " << 1.1 * itsMeasures.point
+                    << colourOf(band, curve) << " notitle";
         }
     }
 
     /// In the units of the layout, the whole picture being the plot.
-    void writeLegend()
+    void writeLegend(const Band& band)
     {
-        const int top = headerHeight + panelHeight + axisHeight;
         itsText << "unset label\nunset border\nunset tics\nunset grid\nunset logscale\n"
                 << "set lmargin at screen 0\nset rmargin at screen 1\n"
                 << "set tmargin at screen 1\nset bmargin at screen 0\n"
                 << "set xrange [0:" << width << "]\nset yrange [" << height() << ":0]\n"
                 << "set label 1 " << quoted(note()) << " at " << width / 2 << ',' << height() - noteHeight / 2
                 << " center noenhanced" << font(11) << " textcolor rgb '" << faintInk << "'\n";
-        const auto count = static_cast<int>(itsCurves.size());
-        const int rows = legendRows();
-        const int left = (width - itsEntryWidth * ((count + rows - 1) / rows)) / 2;
+        const auto count = static_cast<int>(band.curves.size());
+        const int rows = band.legendRows();
+        const int left = (width - band.entryWidth * ((count + rows - 1) / rows)) / 2;
         std::ostringstream commands;
         for (int i = 0; i < count; ++i) {
             const auto curve = static_cast<std::size_t>(i);
-            const int x = left + itsEntryWidth * (i / rows);
-            const int y = top + legendRowHeight * (i % rows) + legendRowHeight / 2;
-            const std::string block = "$LEGEND_" + std::to_string(i);
+            const int x = left + band.entryWidth * (i / rows);
+            const int y = band.legendTop() + legendRowHeight * (i % rows) + legendRowHeight / 2;
+            const std::string block = "$LEGEND_" + band.name + "_" + std::to_string(i);
             const auto row = [y](int place) {
                 return std::to_string(place) + ' ' + std::to_string(y) + '\n';
             };
             // The marker stands in the middle of three places.
             itsText << block << " << END\n"
                     << row(x) << row(x + legendLine / 2) << row(x + legendLine) << "END\n"
-                    << "set label " << i + 2 << ' ' << quoted(legendTitle(itsCurves[curve])) << " at "
+                    << "set label " << i + 2 << ' ' << quoted(legendTitle(band.curves[curve])) << " at "
                     << x + legendLine + 10 << ',' << y << " left noenhanced textcolor rgb '" << ink << "'\n";
-            commands << ", " << block << " with lines" << lineStyle(curve) << " notitle, " << block
-                     << " every ::1::1 with points" << pointStyle(curve) << " notitle";
+            commands << ", " << block << " with lines" << lineStyle(band, curve) << " notitle, " << block
+                     << " every ::1::1 with points" << pointStyle(band, curve) << " notitle";
         }
-        itsText << "plot NaN notitle" << commands.str() << '\n';
+        itsText << "plot NaN notitle" << commands.str() << "\nunset label\n";
     }
 
     /// Explains what is drawn besides lines and markers.
@@ -361,12 +407,9 @@ private:
         return bars + (itsHasBars && itsHasBounds ? "  " : "") + bounds;
     }
 
-    std::vector<Curve> itsCurves;
-    std::vector<Look> itsLooks;
     std::string itsTitle;
     Measures itsMeasures;
-    int itsEntryWidth = legendSample;  // of the legend
-    std::vector<const Quantity*> itsQuantities;
+    std::vector<Band> itsBands;
     std::vector<std::string> itsBlocks;
     bool itsHasBars = false;
     bool itsHasBounds = false;
@@ -399,7 +442,7 @@ std::string quoted(const std::string& text)
 {
     std::string result = "\"";
     for (const char c : printable(text)) {
-        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == ' ';
+        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || c == ' ';
         if (isPlain) {
             result += c;
         } else {

@@ -20,7 +20,8 @@ constexpr int pictureWidth = 1000;
 /// The size that gnuplot calls a font of the size in points.
 double fontSize(const std::string& suffix, double points);
 
-/// A string that gnuplot takes as it stands: only the plainest characters are written as themselves.
+/// A string that gnuplot takes as it stands: only the plainest characters are written as themselves. Digits are none of
+/// them, as gnuplot would take those behind an octal number as more of it.
 std::string quoted(const std::string& text);
 
 /// The whole script, data included. The picture goes to gnuplot's standard output, so that no file name comes into it;

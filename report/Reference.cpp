@@ -219,7 +219,9 @@ private:
         const std::string name =
             itsTitle.empty() ? std::filesystem::path(itsName).stem().string() : std::string(itsTitle);
         for (Curve& curve : curves) {
-            curve.title = curve.title.empty() ? name : name + ": " + curve.title;
+            for (std::string* const title : {&curve.title, &curve.family}) {
+                *title = title->empty() ? name : name + ": " + *title;
+            }
             curve.reference = true;
         }
         return curves;

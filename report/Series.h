@@ -34,18 +34,44 @@ struct Quantity {
 extern const Quantity bitErrorRate;
 extern const Quantity blockErrorRate;
 
+/// What curves are drawn against.
+struct Axis {
+    const char* name;   // "ebn0"
+    const char* title;  // "Eb/N0"
+    const char* label;  // the title and its unit, for gnuplot
+    bool isWhole;       // there are whole numbers alone
+    double (*of)(const Sample& sample);
+};
+
+extern const Axis ebn0Axis;
+extern const Axis iterationAxis;
+
+/// Curves that are drawn together.
+struct View {
+    const Axis* axis;
+    std::vector<Curve> curves;  // in order
+};
+
+/// The curves against Eb/N0 and, where some were counted after several iterations, against these, too. More curves than
+/// can be told apart are no view against iterations.
+std::vector<View> viewsOf(const std::vector<Curve>& curves);
+
 /// Colours that tell series apart on white paper and on dark screens, for colour-blind eyes, too: those of M. Okabe and
 /// K. Ito, without the yellow, which white swallows; with the markers, whose number is not a multiple of theirs, they
 /// make 35 series different. References are grey.
 struct Colour {
-    const char* onLight;
-    const char* onDark;
+    std::string onLight;
+    std::string onDark;
 };
 extern const std::vector<Colour> colours;
 extern const Colour referenceColour;
 
 /// The number of markers: circle, square, triangle, diamond, pentagon. References have them open.
 constexpr std::size_t markers = 5;
+
+/// A family of at least so many curves has colours that run from one to another, from bright to dark on paper and from
+/// dark to bright on screens.
+constexpr std::size_t smallestRun = 4;
 
 /// How a curve is drawn.
 struct Look {
@@ -54,7 +80,7 @@ struct Look {
     std::size_t dash;   // 0 is solid
     std::size_t layer;  // how many of the curves drawn later cover it: it is broader, to show on both sides of them
 };
-Look lookOf(const std::vector<Curve>& curves, std::size_t curve);
+Look lookOf(const std::vector<Curve>& curves, std::size_t curve, const Axis& axis = ebn0Axis);
 
 /// The curves with the references behind the others.
 std::vector<Curve> inOrder(const std::vector<Curve>& curves);

@@ -1,16 +1,32 @@
 // Draws the curves of the report, and shows the figures of the point that is looked at.
 "use strict";
 (() => {
-    const curves = JSON.parse(document.getElementById("data").textContent);
+    const {rows, views} = JSON.parse(document.getElementById("data").textContent);
+    for (const curve of views.flatMap(view => view.curves)) {
+        curve.samples = curve.samples.map(row => rows[row]);
+    }
     const chart = document.getElementById("chart");
     const tip = document.getElementById("tip");
     const bars = document.getElementById("bars");
+    const legend = document.getElementById("legend");
+    const lowered = (dy, text) => element("tspan", {dy, "font-size": 10}, text);
+    const axisOf = {
+        ebn0: {
+            name: "Eb/N0", of: sample => sample.ebn0, text: sample => `${sample.place} dB`, finest: 0, apart: 70, words: "Eb/N0 in dB",
+            label: () => ["E", lowered(3, "b"), element("tspan", {dy: -3}, "/N"), lowered(3, "0"),
+                          element("tspan", {dy: -3}, " (dB)")]},
+        iterations: {
+            name: "Iterations", of: sample => sample.iterations, text: sample => sample.iterations, finest: 1, apart: 40,
+            words: "iterations", label: () => ["Iterations"]},
+    };
     const names = {ber: "Bit error rate (BER)", bler: "Block error rate (BLER)"};
     const margin = {left: 62, right: 16, top: 14, bottom: 52};
     const dashes = ["none", "9 5", "3 3", "10 4 2 4"];
     const arrowLength = 0.4;  // a bound's arrow goes down to this fraction of it
     const reach = 48;         // in pixels, within which a point is found by the pointer
     const hidden = new Set();
+    // Where there is one Eb/N0 only, the curves are those against iterations.
+    let {axis, curves} = views.find(view => view.curves.some(curve => curve.samples.length > 1)) ?? views[0];
     let quantity = "ber";
     let places = [];    // what was drawn: {curve, sample, x, y}
     let current = null; // the one that is looked at
@@ -60,7 +76,7 @@
     // All curves count, hidden or not, so that the axes stay where they are.
     function ranges() {
         const all = curves.flatMap(curve => curve.samples);
-        const x = all.filter(sample => drawn(sample.ber) || drawn(sample.bler)).map(sample => sample.ebn0);
+        const x = all.filter(sample => drawn(sample.ber) || drawn(sample.bler)).map(axisOf[axis].of);
         const y = all.map(sample => sample[quantity]).filter(drawn).flatMap(
             rate => rate.below ? [0.8 * arrowLength * rate.high] : rate.low > 0 ? [rate.value, rate.low] : [rate.value]);
         const least = Math.min(0.5, ...y);
@@ -100,7 +116,9 @@
                 label(margin.left - 10, y + 4, "end", "10", element("tspan", {dy: -5, "font-size": 10}, exponent));
             }
         }
-        const step = niceStep(scale.to - scale.from, Math.max(2, (scale.right - margin.left) / 70));
+        const {finest, apart} = axisOf[axis];
+        const step = Math.max(
+            finest, niceStep(scale.to - scale.from, Math.max(2, (scale.right - margin.left) / apart)));
         const digits = Math.max(0, -Math.floor(Math.log10(step) + 1e-9));
         for (let i = Math.ceil(scale.from / step); i * step <= scale.to; ++i) {
             line("major", scale.x(i * step), margin.top, scale.x(i * step), scale.bottom);
@@ -110,8 +128,7 @@
         line("axis", margin.left, margin.top, margin.left, scale.bottom);
         group.append(element(
             "text", {class: "name", x: (margin.left + scale.right) / 2, y: scale.bottom + 44, "text-anchor": "middle"},
-            "E", element("tspan", {dy: 3, "font-size": 10}, "b"), element("tspan", {dy: -3}, "/N"),
-            element("tspan", {dy: 3, "font-size": 10}, "0"), element("tspan", {dy: -3}, " (dB)")));
+            ...axisOf[axis].label()));
         const middle = (margin.top + scale.bottom) / 2;
         group.append(element(
             "text", {class: "name", x: 16, y: middle, transform: `rotate(-90 16 ${middle})`, "text-anchor": "middle"},
@@ -149,7 +166,7 @@
             if (!drawn(rate)) {
                 continue;
             }
-            const x = scale.x(sample.ebn0);
+            const x = scale.x(axisOf[axis].of(sample));
             const y = scale.y(heightOf(rate));
             places.push({curve, sample, x, y});
             if (rate.below) {
@@ -173,9 +190,9 @@
     }
 
     function describe() {
-        const shown = curves.filter(curve => !hidden.has(curve.index)).map(curve => curve.title);
-        return `${names[quantity]} against Eb/N0 in dB, on a logarithmic scale. Series: ${shown.join("; ") || "none"}. ` +
-            "The table below has all the figures.";
+        const shown = curves.filter(curve => !hidden.has(curve)).map(curve => curve.title);
+        return `${names[quantity]} against ${axisOf[axis].words}, on a logarithmic scale. ` +
+            `Series: ${shown.join("; ") || "none"}. The table below has all the figures.`;
     }
 
     function draw() {
@@ -187,7 +204,7 @@
         const content = element("g", {}, element("title", {}), axes(scale));
         for (const wanted of [true, false]) {
             for (const curve of curves) {
-                if (curve.reference === wanted && !hidden.has(curve.index)) {
+                if (curve.reference === wanted && !hidden.has(curve)) {
                     content.append(drawCurve(curve, scale));
                 }
             }
@@ -225,7 +242,7 @@
         title.textContent = curve.title;
         title.style.borderColor = colourOf(curve);
         const list = document.createElement("dl");
-        pair(list, "Eb/N0", `${sample.place} dB`);
+        pair(list, axisOf[axis].name, axisOf[axis].text(sample));
         for (const [name, rate] of [["BER", sample.ber], ["BLER", sample.bler]]) {
             if (rate !== null) {
                 pair(list, name, rate.text, rate.interval);
@@ -320,7 +337,7 @@
     function addLegend(curve) {
         const button = document.createElement("button");
         button.type = "button";
-        button.setAttribute("aria-pressed", "true");
+        button.setAttribute("aria-pressed", String(!hidden.has(curve)));
         button.append(
             element("svg", {width: 40, height: 16, "aria-hidden": "true"},
                 element("path", {
@@ -329,18 +346,28 @@
                 marker(curve, 20, 8, sizeOf(curve))),
             curve.title);
         button.addEventListener("click", () => {
-            if (!hidden.delete(curve.index)) {
-                hidden.add(curve.index);
+            if (!hidden.delete(curve)) {
+                hidden.add(curve);
             }
-            button.setAttribute("aria-pressed", String(!hidden.has(curve.index)));
+            button.setAttribute("aria-pressed", String(!hidden.has(curve)));
             draw();
         });
         const item = document.createElement("li");
         item.append(button);
-        document.getElementById("legend").append(item);
+        legend.append(item);
     }
 
     curves.forEach(addLegend);
+    for (const choice of document.querySelectorAll("input[name=axis]")) {
+        choice.checked = choice.value === axis;
+        choice.addEventListener("change", () => {
+            ({axis, curves} = views.find(view => view.axis === choice.value));
+            look(null);
+            legend.replaceChildren();
+            curves.forEach(addLegend);
+            draw();
+        });
+    }
     for (const choice of document.querySelectorAll("input[name=quantity]")) {
         choice.addEventListener("change", () => {
             quantity = choice.value;

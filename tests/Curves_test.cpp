@@ -68,4 +68,42 @@ TEST(Curves, WhatIsNotKnownIsNotNamed)
     EXPECT_TRUE(curvesOf({}).empty());
 }
 
+TEST(Curves, ThatDifferInIterationsAloneAreAFamily)
+{
+    const auto curves = curvesOf(
+        {row({512, 8, "scaled", 1, ""}, 0), row({512, 8, "scaled", 2, ""}, 0), row({512, 4, "scaled", 2, ""}, 0)});
+    ASSERT_EQ(curves.size(), 3U);
+    EXPECT_EQ(curves[0].family, "K = 512, 8 units, scaled");
+    EXPECT_EQ(curves[1].family, curves[0].family);
+    EXPECT_NE(curves[2].family, curves[0].family);
+}
+
+TEST(Curves, AgainstIterationsHaveTheSamplesOfAnEbn0)
+{
+    const Setting one{512, 8, "scaled", 1, ""};
+    const Setting six{512, 8, "scaled", 6, ""};
+    const Setting other{40, 8, "scaled", 6, ""};
+    const auto curves = againstIterations(
+        curvesOf({row(six, 1.0), row(six, 0.5), row(one, 0.5), row(one, 1.0), row(one, 2), row(other, 1.0)}));
+    EXPECT_EQ(titles(curves),
+              (std::vector<std::string>{"K = 512, 8 units, scaled, 0.50 dB", "K = 512, 8 units, scaled, 1.00 dB"}))
+        << "where there are several";
+    ASSERT_EQ(curves[1].samples.size(), 2U);
+    EXPECT_EQ(curves[1].samples[0].iterations, 1U);
+    EXPECT_EQ(curves[1].samples[1].iterations, 6U);
+    EXPECT_EQ(curves[1].samples[0].ebn0, 1.0);
+    EXPECT_EQ(curves[0].family, curves[1].family);
+    EXPECT_TRUE(againstIterations(curvesOf({row({}, 0), row({}, 1)})).empty()) << "of unknown iterations";
+}
+
+TEST(Curves, AgainstIterationsKeepReferencesApart)
+{
+    auto curves = curvesOf({row({512, 8, "scaled", 1, ""}, 0), row({512, 8, "scaled", 2, ""}, 0)});
+    curves[1].reference = true;
+    EXPECT_TRUE(againstIterations(curves).empty());
+    curves[0].reference = true;
+    ASSERT_EQ(againstIterations(curves).size(), 1U);
+    EXPECT_TRUE(againstIterations(curves)[0].reference);
+}
+
 }  // namespace

@@ -221,4 +221,18 @@ TEST_F(Plot, ManySeriesAndLongTitlesStayWithinThePicture)
     EXPECT_NE(picture.find("height=\"" + std::to_string(72 + 430 + 66 + 40 * 22 + 34) + "\""), std::string::npos);
 }
 
+TEST_F(Plot, ShowsIterationsInPanelsOfTheirOwn)
+{
+    const std::string both = drawn("a.svg", support::iterationCurves(4, {0, 0.25, 1.5}));
+    EXPECT_NE(both.find(">Iterations<"), std::string::npos);
+    EXPECT_NE(both.find(">K = 512, 8 units, scaled, 4 iterations<"), std::string::npos);
+    EXPECT_NE(both.find(">K = 512, 8 units, scaled, 0.25 dB<"), std::string::npos);
+    EXPECT_NE(both.find("height=\"" + std::to_string(2 * (72 + 430 + 66) + (2 + 1) * 22 + 34) + "\""), std::string::npos)
+        << both.substr(0, 300);
+    const std::string one = drawn("b.svg", support::iterationCurves(4, {0.25}));
+    EXPECT_NE(one.find(">Iterations<"), std::string::npos);
+    EXPECT_EQ(one.find("4 iterations<"), std::string::npos) << "points are no curve";
+    EXPECT_NE(one.find("height=\"" + std::to_string(72 + 430 + 66 + 22 + 34) + "\""), std::string::npos);
+}
+
 }  // namespace

@@ -101,4 +101,81 @@ TEST(Series, AtMostThreeLayersAreShown)
     EXPECT_EQ(lookOf(std::vector<Curve>(9, curve), 6).layer, 2U);
 }
 
+/// How bright the eye finds a colour, 0 to 2550.
+int brightness(const std::string& colour)
+{
+    const auto part = [&colour](std::size_t start) {
+        return std::stoi(colour.substr(start, 2), nullptr, 16);
+    };
+    return 2 * part(1) + 7 * part(3) + part(5);
+}
+
+TEST(Series, ALargeFamilyHasColoursThatRun)
+{
+    std::vector<Curve> curves = support::iterationCurves(15, {0, 1});
+    curves.push_back(reference);
+    std::set<std::string> seen;
+    for (std::size_t i = 0; i < 15; ++i) {
+        const Look look = lookOf(curves, i);
+        ASSERT_EQ(look.colour.onLight.size(), 7U);
+        seen.insert(look.colour.onLight);
+        EXPECT_EQ(look.layer, 0U);
+        if (i > 0) {
+            EXPECT_LT(brightness(look.colour.onLight), brightness(lookOf(curves, i - 1).colour.onLight)) << i;
+            EXPECT_GT(brightness(look.colour.onDark), brightness(lookOf(curves, i - 1).colour.onDark)) << i;
+        }
+    }
+    EXPECT_EQ(seen.size(), 15U);
+    EXPECT_EQ(lookOf(curves, 15).colour.onLight, referenceColour.onLight);
+}
+
+TEST(Series, FamiliesHaveOtherColoursEach)
+{
+    std::vector<Curve> curves = support::iterationCurves(4, {0});
+    const std::vector<Curve> first = curves;
+    for (Curve each : first) {
+        each.family = "another";
+        curves.push_back(each);
+    }
+    std::set<std::string> seen;
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        seen.insert(lookOf(curves, i).colour.onLight);
+    }
+    EXPECT_EQ(seen.size(), 8U);
+    EXPECT_EQ(lookOf(curves, 0).colour.onLight, lookOf(first, 0).colour.onLight);
+}
+
+TEST(Series, ASmallFamilyHasColoursThatDiffer)
+{
+    const std::vector<Curve> curves = support::iterationCurves(3, {0});
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        EXPECT_EQ(lookOf(curves, i).colour.onLight, colours[i].onLight);
+    }
+}
+
+TEST(Series, AreSeenAgainstIterationsWhereThereAreSome)
+{
+    EXPECT_EQ(viewsOf(support::sampleCurves()).size(), 1U);
+    std::vector<Curve> curves = support::iterationCurves(3, {0, 1});
+    curves.insert(curves.begin(), reference);
+    const std::vector<View> views = viewsOf(curves);
+    ASSERT_EQ(views.size(), 2U);
+    EXPECT_EQ(views[0].axis, &ebn0Axis);
+    EXPECT_EQ(views[0].curves.size(), 4U);
+    EXPECT_TRUE(views[0].curves[3].reference);
+    EXPECT_EQ(views[1].axis, &iterationAxis);
+    EXPECT_EQ(views[1].curves.size(), 2U);
+    EXPECT_EQ(iterationAxis.of(views[1].curves[0].samples[2]), 3);
+    for (Curve& each : curves) {
+        each.reference = true;
+    }
+    EXPECT_EQ(viewsOf(curves).size(), 1U) << "references alone";
+    EXPECT_EQ(viewsOf(support::iterationCurves(2, std::vector<double>(40, 1))).size(), 2U);
+    std::vector<double> many;
+    for (int i = 0; i <= 40; ++i) {
+        many.push_back(i);
+    }
+    EXPECT_EQ(viewsOf(support::iterationCurves(2, many)).size(), 1U) << "more than can be told apart";
+}
+
 }  // namespace

@@ -25,6 +25,14 @@ void write(const std::string& folder)
          "morvik ber --block-size 512 --algorithm scaled,max-log --seed 1"});
 }
 
+void writeIterations(const std::string& folder)
+{
+    const std::vector<report::Curve> curves = support::iterationCurves(12, {0, 0.25, 0.5, 0.75, 1});
+    report::writePlot(folder + "/iterations.png", curves, "After each iteration");
+    report::writeReport(folder + "/iterations.html", curves, {"After each iteration", {}, ""});
+    report::writeReport(folder + "/one_ebn0.html", support::iterationCurves(12, {1}), {"At one Eb/N0", {}, ""});
+}
+
 void writeHostile(const std::string& folder)
 {
     const std::vector<report::Curve> curves = support::hostileCurves();
@@ -43,6 +51,7 @@ int main(int argc, char** argv)
     }
     try {
         write(argv[1]);
+        writeIterations(argv[1]);
         writeHostile(argv[1]);
         return 0;
     } catch (const std::exception& error) {

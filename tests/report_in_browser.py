@@ -165,7 +165,7 @@ class ReportInBrowser(unittest.TestCase):
         self.assertEqual(figures, {
             "Eb/N0": "1.00 dB", "BER": "4.18e-03" + "3.73e-03 … 4.67e-03", "BLER": "7.13e-02" + "6.36e-02 … 7.98e-02",
             "Blocks": "4\u202f224", "Bit errors": "9\u202f030", "Block errors": "301", "Clipped": "2.72e-03"})
-        self.assertEqual(self.evaluate("document.querySelector('tr.marked').id"), "p0-4")
+        self.assertEqual(self.evaluate("document.querySelector('tr.marked').id"), "p4")
         self.browser.move(3, 3)
         self.assertFalse(self.tip_is_shown())
         self.assertEqual(self.count("tr.marked"), 0)
@@ -203,8 +203,47 @@ class ReportInBrowser(unittest.TestCase):
         rows = self.evaluate("Array.from(document.querySelectorAll('.points tbody'), body => body.rows.length - 1)")
         self.assertEqual(rows, [10, 10, 9])
         self.assertEqual(
-            self.texts("#p0-4 td"),
+            self.texts("#p4 td"),
             ["1.00", "4.18e-03", "3.73e-03 … 4.67e-03", "7.13e-02", "6.36e-02 … 7.98e-02", "4\u202f224", "9\u202f030", "301", "2.72e-03"])
+
+    # ---- Against iterations
+
+    def test_iterations_are_an_axis_where_there_are_several(self):
+        self.assertEqual(self.count("input[name=axis]"), 0)
+        self.open("iterations.html")
+        self.assertEqual(len(self.texts("#legend button")), 12)
+        self.browser.click(*self.middle(".choice", 3))
+        self.assertEqual(self.texts("#legend button"), [f"K = 512, 8 units, scaled, {place:.2f} dB" for place in (0, 0.25, 0.5, 0.75, 1)])
+        self.assertEqual(self.count("#chart path.curve"), 5)
+        self.assertEqual(self.count("#chart .marker"), 60)
+        self.assertIn("against iterations", self.text("#chart desc"))
+        (x0, _), (x1, _), (x11, _) = [self.middle("#chart .own[data-curve='0'] .marker", i) for i in (0, 1, 11)]
+        self.assertAlmostEqual((x11 - x0) / (x1 - x0), 11, delta=0.02)
+        self.assertEqual(self.texts("#chart text")[-14:-2], [str(i) for i in range(1, 13)], "whole numbers")
+        self.browser.move(*self.middle("#chart .own[data-curve='1'] .marker", 2))
+        self.assertEqual(self.text("#tip strong"), "K = 512, 8 units, scaled, 0.25 dB")
+        self.assertEqual(dict(zip(self.texts("#tip dt"), self.texts("#tip dd")))["Iterations"], "3")
+        self.assertEqual(self.texts("tr.marked td")[0], "0.25")
+        self.browser.click(*self.middle(".choice", 2))
+        self.assertEqual(len(self.texts("#legend button")), 12)
+        self.assertIn("against Eb/N0", self.text("#chart desc"))
+        self.assertEqual(self.browser.messages, [])
+
+    def test_iterations_are_shown_first_where_there_is_one_ebn0(self):
+        self.open("one_ebn0.html")
+        self.assertEqual(self.count("#chart path.curve"), 1)
+        self.assertIn("against iterations", self.text("#chart desc"))
+        self.assertTrue(self.evaluate("document.querySelector('input[value=iterations]').checked"))
+
+    def test_a_family_has_colours_that_run(self):
+        self.open("iterations.html")
+        stroke = "Array.from(document.querySelectorAll('#chart path.curve'), line => getComputedStyle(line).stroke)"
+        self.assertEqual(len(set(self.evaluate(stroke))), 12)
+        light = [brightness(colour) for colour in self.evaluate(stroke)]
+        self.assertEqual(light, sorted(light, reverse=True))
+        self.browser.media(scheme="dark")
+        dark = [brightness(colour) for colour in self.evaluate(stroke)]
+        self.assertEqual(dark, sorted(dark))
 
     # ---- Everywhere
 
@@ -266,6 +305,9 @@ class ReportInBrowser(unittest.TestCase):
         self.screenshot("narrow")
         self.open("hostile.html")
         self.screenshot("hostile")
+        self.open("iterations.html")
+        self.browser.click(*self.middle(".choice", 3))
+        self.screenshot("iterations")
         self.open("report.html")
         self.browser.media()
         SCREENSHOTS.joinpath("printed.pdf").write_bytes(base64.b64decode(self.browser.call("Page.printToPDF")["data"]))

@@ -79,4 +79,16 @@ std::vector<report::Curve> hostileCurves()
             curve("'; system 'touch injected' # `touch injected` $(touch injected) {/:Bold x}_1^2 @HOME %s", 0)};
 }
 
+std::vector<report::Curve> iterationCurves(unsigned iterations, const std::vector<double>& decibels)
+{
+    std::vector<report::Row> rows;
+    for (unsigned i = 1; i <= iterations; ++i) {
+        for (const double ebn0 : decibels) {
+            const double errors = 10000 * std::exp(-0.5 * i * (ebn0 + 0.5));
+            rows.push_back({{512, 8, "scaled", i, ""}, sampleAt(ebn0, 12000, static_cast<std::uint64_t>(errors))});
+        }
+    }
+    return report::curvesOf(rows);
+}
+
 }  // namespace support

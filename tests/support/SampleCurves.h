@@ -15,6 +15,9 @@ std::vector<report::Curve> sampleCurves();
 /// The same with titles that try to be markup, commands and strings' ends, the last curve covering the one before.
 std::vector<report::Curve> hostileCurves();
 
+/// The samples after each of `iterations` iterations, at some Eb/N0.
+std::vector<report::Curve> iterationCurves(unsigned iterations, const std::vector<double>& decibels);
+
 }  // namespace support
 
 #endif
