@@ -60,10 +60,10 @@ void checkInstructionSet(const std::string& name)
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
-    const Pictures pictures(options.pictures, options.output);
     const Interruption interruption;
     std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
+    const Pictures pictures(options.pictures, options.output);
     if (options.resume && journal.isEmpty()) {
         std::cerr << means.command << ": nothing to resume, starts from the beginning" << std::endl;
     }

@@ -8,9 +8,10 @@
 #include <cerrno>
 #include <cstdio>
 #include <filesystem>
-#include <string_view>
 #include <system_error>
+#include <utility>
 
+#include "Descriptor.h"
 #include "Error.h"
 
 namespace simulation {
@@ -41,51 +42,6 @@ std::string folderOf(const std::string& place)
     const std::filesystem::path folder = std::filesystem::path(place).parent_path();
     return folder.empty() ? "." : folder.string();
 }
-
-/// An open file, closed at the end of its life.
-class Descriptor {
-public:
-    explicit Descriptor(int number) : itsNumber(number) {}
-    Descriptor(const Descriptor&) = delete;
-    Descriptor& operator=(const Descriptor&) = delete;
-
-    ~Descriptor()
-    {
-        const int reason = errno;  // that a caller is still to tell
-        close(itsNumber);
-        errno = reason;
-    }
-
-    bool isOpen() const
-    {
-        return itsNumber >= 0;
-    }
-
-    bool write(std::string_view content) const
-    {
-        while (!content.empty()) {
-            const ssize_t written = ::write(itsNumber, content.data(), content.size());
-            if (written < 0 && errno != EINTR) {
-                return false;
-            }
-            content.remove_prefix(written > 0 ? static_cast<std::size_t>(written) : 0);
-        }
-        return true;
-    }
-
-    bool sync() const
-    {
-        return fsync(itsNumber) == 0 || errno == EINVAL;  // that is: a file system without it
-    }
-
-    bool allow(mode_t mode) const
-    {
-        return fchmod(itsNumber, mode) == 0;
-    }
-
-private:
-    int itsNumber;
-};
 
 /// A new file beside another, removed at the end of its life unless it took the other's place. Its name is always the
 /// same, so that the one that a killed run has left is overwritten by the next.
@@ -129,6 +85,12 @@ public:
         return itsIsPlaced;
     }
 
+    /// The file itself, which is not written any more.
+    Descriptor& descriptor()
+    {
+        return itsFile;
+    }
+
 private:
     std::string itsPlace;
     std::string itsName;
@@ -140,12 +102,21 @@ private:
 
 void writeAtomically(const std::string& fileName, const std::string& content)
 {
+    writeLocked(fileName, content, false);
+}
+
+Descriptor writeLocked(const std::string& fileName, const std::string& content, bool isLocked)
+{
     const std::string place = placeOf(fileName);
     NewFile file(place);
+    if (file.isMade() && isLocked) {
+        file.descriptor().lock();
+    }
     if (!file.isMade() || !file.write(content) || !file.place()) {
         throw fileError(fileName, "written");
     }
     Descriptor(open(folderOf(place).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)).sync();  // the new name, too
+    return std::move(file.descriptor());
 }
 
 void checkWritable(const std::string& fileName)

@@ -1,9 +1,6 @@
 // Journal: what a run has counted, kept in memory and on the disk.
 #include "Journal.h"
 
-#include <unistd.h>
-
-#include <cerrno>
 #include <filesystem>
 #include <utility>
 
@@ -22,9 +19,13 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
         return;
     }
     formatOf(itsOutput);
-    checkWritable(itsOutput);
     const std::string checkpointFile = checkpointName();
-    const bool isUnfinished = std::filesystem::exists(checkpointFile);
+    itsFile.emplace(checkpointFile);
+    if (itsFile->isTaken()) {
+        throw Error(itsOutput + ": another run is writing it; wait for that to end, or choose another name");
+    }
+    checkWritable(itsOutput);
+    const bool isUnfinished = !itsFile->isNew();
     if (isUnfinished && earlier == Earlier::refuse) {
         throw Error(checkpointFile + ": holds an unfinished run; go on with it by --resume, or remove it");
     }
@@ -33,6 +34,10 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     } else if (earlier == Earlier::resume && std::filesystem::exists(itsOutput)) {
         takeComplete();
     }
+}
+
+void Journal::begin()
+{
     save(itsCheckpoint.running);
 }
 
@@ -63,10 +68,10 @@ void Journal::end(const PointResult& point)
 void Journal::save(const std::optional<PointResult>& running)
 {
     itsCheckpoint.running = running;
-    if (itsOutput.empty()) {
+    if (!itsFile) {
         return;
     }
-    writeAtomically(checkpointName(), checkpointText(itsCheckpoint));
+    itsFile->write(checkpointText(itsCheckpoint));
     if (itsResultsSaved < itsCheckpoint.ended.size()) {
         writeResults(itsOutput, resultsOf(itsPlan, itsCheckpoint.ended));
         itsResultsSaved = itsCheckpoint.ended.size();
@@ -76,8 +81,8 @@ void Journal::save(const std::optional<PointResult>& running)
 void Journal::complete()
 {
     save(std::nullopt);
-    if (!itsOutput.empty() && unlink(checkpointName().c_str()) != 0) {
-        throw fileError(checkpointName(), "removed");
+    if (itsFile) {
+        itsFile->remove();
     }
 }
 

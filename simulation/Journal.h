@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "Checkpoint.h"
+#include "OwnFile.h"
 #include "Plan.h"
 
 namespace simulation {
@@ -20,9 +21,12 @@ public:
     /// checkpoint, but results; going on from there, nothing is left to do.
     enum class Earlier { refuse, resume };
 
-    /// Opens the journal, and finds out whether it can be kept. Without an output it is kept in memory alone. The plan
-    /// outlives the journal.
+    /// Opens the journal, for no other run to open it, too, and finds out whether it can be kept. Without an output it
+    /// is kept in memory alone. The plan outlives the journal.
     Journal(const Plan& plan, std::string output, Earlier earlier);
+
+    /// Writes the files as they are at the beginning of a run.
+    void begin();
 
     /// Whether nothing has been counted yet.
     bool isEmpty() const;
@@ -52,6 +56,7 @@ private:
     const Plan& itsPlan;
     std::string itsOutput;
     Checkpoint itsCheckpoint;
+    std::optional<OwnFile> itsFile;   // that the checkpoint is kept in
     std::size_t itsResultsSaved = 0;  // how many points the results had when they were written last
 };
 

@@ -166,6 +166,7 @@ private:
 bool run(const Plan& plan, const RunParts& parts)
 {
     Journal& journal = parts.journal;
+    journal.begin();
     Saving saving(parts);
     for (const PointResult& point : journal.ended()) {
         parts.progress.hasEnded(point);

@@ -47,7 +47,8 @@ protected:
 
 TEST_F(JournalFiles, AreACheckpointAtFirst)
 {
-    const Journal journal(plan, output, Earlier::refuse);
+    Journal journal(plan, output, Earlier::refuse);
+    journal.begin();
     EXPECT_TRUE(journal.isEmpty());
     EXPECT_EQ(folder.names(), Names{"results.csv.checkpoint"});
     EXPECT_EQ(journal.resultSoFar(1).tally.blocks, 0U);
@@ -169,7 +170,8 @@ TEST_F(JournalFiles, AreNotLostToAnotherRun)
 TEST_F(JournalFiles, OfOtherParametersAreRefused)
 {
     {
-        const Journal journal(plan, output, Earlier::refuse);
+        Journal journal(plan, output, Earlier::refuse);
+        journal.begin();
     }
     plan.command = "morvik ber --seed 2";
     EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run with other parameters: morvik ber --seed 1");
@@ -189,6 +191,32 @@ TEST_F(JournalFiles, ThatCannotBeWrittenAreRefusedAtOnce)
     EXPECT_THROW(Journal(plan, folder.path("none/results.csv"), Earlier::refuse), Error);
     EXPECT_THROW(Journal(plan, folder.path("results.txt"), Earlier::refuse), Error);
     EXPECT_EQ(folder.names(), Names{});
+}
+
+TEST_F(JournalFiles, AreOfOneRunAtATime)
+{
+    const std::string taken = output + ": another run is writing it; wait for that to end, or choose another name";
+    {
+        Journal journal(plan, output, Earlier::refuse);
+        EXPECT_EQ(refusal(Earlier::refuse), taken);
+        EXPECT_EQ(refusal(Earlier::resume), taken);
+        journal.begin();
+        EXPECT_EQ(refusal(Earlier::resume), taken);
+        journal.save(resultOf(0, 10));
+        EXPECT_EQ(refusal(Earlier::resume), taken);
+        journal.end(resultOf(0, 20));
+        journal.complete();
+    }
+    EXPECT_EQ(refusal(Earlier::refuse), "none");
+    EXPECT_EQ(folder.names(), Names{"results.csv"});
+}
+
+TEST_F(JournalFiles, AreNotLeftByRunsThatNeverBegan)
+{
+    EXPECT_EQ(refusal(Earlier::refuse), "none");
+    EXPECT_EQ(folder.names(), Names{});
+    folder.write("results.csv.checkpoint", "");  // of a run that was killed when it had just taken it
+    EXPECT_EQ(refusal(Earlier::refuse), "none");
 }
 
 }  // namespace

@@ -227,7 +227,8 @@ TEST_F(Plot, ShowsIterationsInPanelsOfTheirOwn)
     EXPECT_NE(both.find(">Iterations<"), std::string::npos);
     EXPECT_NE(both.find(">K = 512, 8 units, scaled, 4 iterations<"), std::string::npos);
     EXPECT_NE(both.find(">K = 512, 8 units, scaled, 0.25 dB<"), std::string::npos);
-    EXPECT_NE(both.find("height=\"" + std::to_string(2 * (72 + 430 + 66) + (2 + 1) * 22 + 34) + "\""), std::string::npos)
+    EXPECT_NE(both.find("height=\"" + std::to_string(2 * (72 + 430 + 66) + (2 + 1) * 22 + 34) + "\""),
+              std::string::npos)
         << both.substr(0, 300);
     const std::string one = drawn("b.svg", support::iterationCurves(4, {0.25}));
     EXPECT_NE(one.find(">Iterations<"), std::string::npos);

@@ -157,6 +157,22 @@ TEST_F(BerRuns, EndBySignalsWithACheckpoint)
     }
 }
 
+TEST_F(BerRuns, HaveTheirOutputForThemselves)
+{
+    const std::string expected = berFile(longPoint, "expected.csv");
+    Process process = start(longPoint);
+    ASSERT_TRUE(waitForCheckpoint("\"running\""));
+    for (const Arguments& more : {Arguments{}, Arguments{"--resume"}, words("--seed 2 --resume")}) {
+        expectRefused(
+            Arguments{"ber", "--output", "results.csv", "--plot", "curves.svg"} + longPoint + more,
+            "morvik ber: results.csv: another run is writing it; wait for that to end, or choose another name");
+    }
+    process.send(SIGKILL);
+    process.wait();
+    EXPECT_EQ(resume(longPoint), expected) << "a killed run has nothing any more";
+    EXPECT_EQ(morvik.names(), (Arguments{"expected.csv", "messages", "results.csv"}));
+}
+
 TEST_F(BerRuns, ThatIgnoreSignalsGoOnIgnoringThem)
 {
     const CommandRunner shell("/bin/sh");
@@ -252,7 +268,7 @@ TEST_F(BerRuns, ResumeNoOtherRun)
     }
     EXPECT_EQ(checkpoint(), kept);
 
-    for (const std::string& damaged : {kept.substr(0, kept.size() / 2), kept + "x", std::string()}) {
+    for (const std::string& damaged : {kept.substr(0, kept.size() / 2), kept + "x", std::string("\n")}) {
         morvik.write("results.csv.checkpoint", damaged);
         expectRefused(again + Arguments{"--resume"},
                       place + "is damaged and cannot be resumed; remove it to start anew");

@@ -1,0 +1,52 @@
+// OwnFile: a file that one process at a time has for itself.
+#include "OwnFile.h"
+
+#include <fcntl.h>
+
+#include <utility>
+
+#include "AtomicFile.h"
+#include "Error.h"
+
+namespace simulation {
+
+OwnFile::OwnFile(std::string fileName) : itsName(std::move(fileName)), itsFile(-1)
+{
+    // Between the two steps the file may have gone, or another may have taken its place, with the lock on that one.
+    constexpr int patience = 100;  // with a file system that tells files apart by nothing steady
+    for (int i = 0; i < patience && !itsIsTaken && !itsFile.isAt(itsName); ++i) {
+        itsFile = Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0666));
+        itsIsTaken = itsFile.isOpen() && !itsFile.lock();
+    }
+}
+
+OwnFile::~OwnFile()
+{
+    if (!itsIsTaken && itsFile.isEmpty() && itsFile.isAt(itsName)) {
+        unlink(itsName.c_str());
+    }
+}
+
+bool OwnFile::isTaken() const
+{
+    return itsIsTaken;
+}
+
+bool OwnFile::isNew() const
+{
+    return itsFile.isEmpty();
+}
+
+void OwnFile::write(const std::string& content)
+{
+    itsFile = writeLocked(itsName, content, true);
+}
+
+void OwnFile::remove()
+{
+    if (unlink(itsName.c_str()) != 0) {
+        throw fileError(itsName, "removed");
+    }
+}
+
+}  // namespace simulation
