@@ -22,11 +22,11 @@ stage_lint() {
     mkdir -p build/lint
     sed 's/ -fno-tree-[a-z]*//g' build/x86_64/compile_commands.json >build/lint/compile_commands.json
     # Two units of bench/ need packages that are not set up here, and Octave's own compiler builds its function.
-    git ls-files {src,lanes,link,simulation,report,testbench,trace,comparison,vectors,app,bindings,tests,bench}/'*.cpp' |
+    git ls-files {src,lanes,link,simulation,report,testbench,trace,comparison,vectors,validation,app,bindings,tests,bench}/'*.cpp' |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp|bindings/octave/morvik_mex\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
-        --suppress=internalAstError -I include -I src -I . src link simulation report testbench trace vectors app
+        --suppress=internalAstError -I include -I src -I . src link simulation report testbench trace vectors validation app
 }
 
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.

@@ -1,0 +1,111 @@
+"""The arithmetic of the comparison: interpolation between points, and the uncertainty of what comes out."""
+
+import math
+import pathlib
+import random
+import sys
+import tempfile
+import unittest
+
+sys.dont_write_bytecode = True  # the tree stays as it is
+from distances import Estimate, Point, crossing, paired_step, read_curves, read_reference
+from validate import DOCUMENT, with_tables
+
+
+def curve(start, per_decade, blocks=1000000):
+    """Points every 0.5 dB of a rate that is 1 at `start` dB and falls tenfold every `per_decade` dB."""
+    return [Point(db, blocks, round(blocks * 10 ** (-(db - start) / per_decade))) for db in (1, 1.5, 2, 2.5, 3)]
+
+
+class Crossing(unittest.TestCase):
+    def test_lies_where_a_straight_line_of_the_logarithm_has_the_rate(self):
+        self.assertAlmostEqual(crossing(curve(0.25, 1), 0.1).db, 1.25, places=4)
+        self.assertAlmostEqual(crossing(curve(0.25, 1), 0.01).db, 2.25, places=4)
+
+    def test_takes_points_in_any_order(self):
+        points = curve(0.25, 1)
+        self.assertEqual(crossing(points[::-1], 0.1), crossing(points, 0.1))
+
+    def test_takes_a_point_that_has_the_very_rate(self):
+        self.assertAlmostEqual(crossing([Point(1, 100, 10), Point(2, 1000, 10)], 0.1).db, 1)
+
+    def test_is_none_where_the_points_do_not_reach_the_rate(self):
+        self.assertIsNone(crossing(curve(0.25, 1), 0.5))
+        self.assertIsNone(crossing(curve(0.25, 1), 0.001))
+
+    def test_does_not_reach_down_to_a_point_without_errors(self):
+        self.assertIsNone(crossing([Point(1, 100, 50), Point(2, 100, 0)], 0.1))
+
+    def test_deviation_is_that_of_repeated_simulations(self):
+        rates = {1.0: 0.3, 1.5: 0.03}
+        draw = random.Random(1)
+
+        def simulated():
+            return [Point(db, 400, sum(draw.random() < rate for _ in range(400))) for db, rate in rates.items()]
+
+        found = [crossing(simulated(), 0.1) for _ in range(400)]
+        mean = sum(one.db for one in found) / len(found)
+        spread = math.sqrt(sum((one.db - mean) ** 2 for one in found) / (len(found) - 1))
+        expected = math.sqrt(sum(one.deviation ** 2 for one in found) / len(found))
+        self.assertLess(abs(spread / expected - 1), 0.15)
+
+    def test_deviations_of_a_difference_add_as_squares(self):
+        difference = Estimate(2, 0.03) - Estimate(1, 0.04)
+        self.assertAlmostEqual(difference.db, 1)
+        self.assertAlmostEqual(difference.deviation, 0.05)
+
+    def test_shows_the_95_percent_interval(self):
+        self.assertEqual(str(Estimate(0.1234, 0.01)), "0.123 ± 0.020")
+        self.assertEqual(str(Estimate(-0.0001, 0.01)), "0.000 ± 0.020")
+
+
+class PairedStep(unittest.TestCase):
+    def test_is_the_distance_of_the_curves(self):
+        step = paired_step(curve(0.25, 1), curve(0.35, 1), dict.fromkeys((1, 1.5, 2, 2.5, 3), 0), 0.1)
+        self.assertAlmostEqual(step.db, 0.1, places=4)
+        self.assertEqual(step.deviation, 0)
+
+    def test_deviation_is_that_of_repeated_simulations(self):
+        both, one = {1.0: 0.28, 1.5: 0.025}, {1.0: 0.02, 1.5: 0.005}  # both fail; one alone fails, either
+        draw = random.Random(2)
+
+        def simulated():
+            before, after, disagreements = [], [], {}
+            for db in both:
+                joint = sum(draw.random() < both[db] for _ in range(400))
+                first, second = (sum(draw.random() < one[db] for _ in range(400)) for _ in range(2))
+                before.append(Point(db, 400, joint + first))
+                after.append(Point(db, 400, joint + second))
+                disagreements[db] = first + second
+            return paired_step(before, after, disagreements, 0.1)
+
+        found = [simulated() for _ in range(300)]
+        spread = math.sqrt(sum(step.db ** 2 for step in found) / len(found))  # the curves are the same
+        expected = math.sqrt(sum(step.deviation ** 2 for step in found) / len(found))
+        self.assertLess(abs(spread / expected - 1), 0.15)
+
+
+class Files(unittest.TestCase):
+    def read(self, text, reader, *keys):
+        with tempfile.TemporaryDirectory() as folder:
+            path = pathlib.Path(folder) / "rates.csv"
+            path.write_text(text, encoding="utf-8")
+            return reader(path, *keys)
+
+    def test_reads_a_reference_behind_its_comments(self):
+        points = self.read("# title: x\nebn0_db,esn0_db,frames,frame_errors\n0.50,-4,200,20\n", read_reference)
+        self.assertEqual(points, [Point(0.5, 200, 20)])
+
+    def test_divides_results_into_curves(self):
+        curves = self.read("num_pu,ebn0_db,blocks,block_errors\n2,1,9,3\n4,1,9,2\n2,1.5,9,1\n", read_curves, "num_pu")
+        self.assertEqual(curves, {("2",): [Point(1, 9, 3), Point(1.5, 9, 1)], ("4",): [Point(1, 9, 2)]})
+
+
+class Document(unittest.TestCase):
+    def test_has_the_tables_that_the_results_give(self):
+        text = DOCUMENT.read_text(encoding="utf-8")
+        self.assertEqual(with_tables(text), text)
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,224 @@
+// morvik_variants: block error rates while the model's arithmetic changes, step by step, from a fine and undivided
+// decoder into the hardware's. All variants decode the same received values, so that their difference is far more exact
+// than each of them.
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <cstdint>
+#include <cstdio>
+#include <exception>
+#include <iostream>
+#include <memory>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "TDecoder3G.h"
+#include "link/Channel.h"
+#include "link/DefaultScale.h"
+#include "link/GaussianNumber.h"
+#include "link/Random.h"
+#include "link/TurboEncoder.h"
+
+namespace {
+
+using namespace morvik::link;
+
+/// A decoder on the way to the hardware's. Fraction bits more than three divide a step of the soft values.
+struct Variant {
+    const char* name;
+    std::size_t predecessor;  ///< the variant from which it is one step
+    const char* stateFormat;
+    const char* branchFormat;
+    const char* decoder;  ///< properties; empty: neither segments nor windows
+};
+
+/// The limit of the branch metrics is 64 in `fine`, 16 in all others. `hardware_N` is the model with N units.
+constexpr std::array<Variant, 7> variants = {{
+    {"fine", 0, "Fix_16_6", "Fix_13_6", ""},
+    {"clipped", 0, "Fix_16_6", "Fix_11_6", ""},
+    {"undivided", 1, "Fix_12_3", "Fix_8_3", ""},
+    {"windows", 2, "Fix_12_3", "Fix_8_3", "3GPPPU:1,1"},
+    {"hardware_2", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:2"},
+    {"hardware_4", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:4"},
+    {"hardware_8", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:8"},
+}};
+
+/// Passes on what a factory made.
+template <class Component>
+std::unique_ptr<Component> made(Component* component)
+{
+    if (component == nullptr) {
+        throw std::runtime_error("a component cannot be made");
+    }
+    return std::unique_ptr<Component>(component);
+}
+
+class VariantDecoder {
+public:
+    VariantDecoder(const Variant& variant, int algorithm)
+        : itsState(made(TNumberFormat::create(variant.stateFormat))),
+          itsBranch(made(TNumberFormat::create(variant.branchFormat))),
+          itsInterleaver(made(TInterleaver::create("3GPPLTE"))),
+          itsEngine(made(TCalculationEngine::create(algorithm == 2 ? "MOD#:16" : "MOD"))),
+          itsDecoder(made(*variant.decoder == '\0' ? TDecoder3G::create(false, "") : TDecoder::create(variant.decoder)))
+    {
+        itsEngine->itsStateFormat = itsState.get();
+        itsEngine->itsBranchFormat = itsEngine->itsInputFormat = itsBranch.get();
+        if (!itsEngine->initialise()) {
+            throw std::runtime_error("the engine cannot be initialised");
+        }
+        itsDecoder->itsInterleaver = itsInterleaver.get();
+        itsDecoder->itsEngine = itsEngine.get();
+        itsDecoder->itsExtrinsicScale = algorithm == 1 ? 0.75 : 1.0;
+    }
+
+    /// Whether the block that was received, in units of the sent amplitude, decodes without an error. `scale` counts
+    /// steps of the hardware's soft values, eighths.
+    bool decodes(const std::vector<double>& received,
+                 double scale,
+                 unsigned iterations,
+                 const std::vector<unsigned char>& sent)
+    {
+        const double steps = scale * itsState->itsScale / 8;
+        itsSoft.clear();
+        for (const double value : received) {
+            const double rounded = std::round(value * steps);
+            const double lowest = itsBranch->itsMinQ;
+            const double highest = itsBranch->itsMaxQ;
+            itsSoft.push_back(itsState->place(static_cast<std::int32_t>(std::clamp(rounded, lowest, highest))));
+        }
+        if (!itsDecoder->decode(itsSoft, itsHard, iterations)) {
+            throw std::runtime_error("a block was refused");
+        }
+        return itsHard == sent;
+    }
+
+private:
+    std::unique_ptr<TNumberFormat> itsState;
+    std::unique_ptr<TNumberFormat> itsBranch;
+    std::unique_ptr<TInterleaver> itsInterleaver;
+    std::unique_ptr<TCalculationEngine> itsEngine;
+    std::unique_ptr<TDecoder> itsDecoder;
+    std::vector<short> itsSoft;
+    std::vector<unsigned char> itsHard;
+};
+
+/// Blocks of random bits as they are received, those of seed 1.
+class ReceivedBlocks {
+public:
+    ReceivedBlocks(unsigned K, int milliDecibels)
+        : itsK(K),
+          itsMilliDecibels(milliDecibels),
+          itsDeviation(static_cast<double>(noiseDeviation(K, milliDecibels))),
+          itsEncoder(K)
+    {
+    }
+
+    void make(std::uint64_t number)
+    {
+        const FrameRandom random(randomKey(1), itsK, itsMilliDecibels, number);
+        PackedBlocks information{itsEncoder.words(), std::vector<std::uint64_t>(itsEncoder.words())};
+        sent.assign(itsK, 0);
+        for (unsigned i = 0; i < itsK; ++i) {
+            const RandomBlock block = random.block(random_index::information + i / 128);
+            sent[i] = block[i % 128 / 32] >> i % 32 & 1;
+            information.bits[i / 64] |= std::uint64_t{sent[i]} << i % 64;
+        }
+        itsEncoder.encode(information, 1, itsStreams);
+        received.clear();
+        for (unsigned i = 0; i < 3 * (itsK + 4); ++i) {
+            const std::uint64_t bit = itsStreams[i % 3].bits[i / 3 / 64] >> i / 3 % 64 & 1;
+            const double noise = gaussianNumber(random.block(random_index::gaussian + i));
+            received.push_back((bit != 0 ? 1 : -1) + itsDeviation * noise);
+        }
+    }
+
+    std::vector<unsigned char> sent;
+    std::vector<double> received;
+
+private:
+    unsigned itsK;
+    int itsMilliDecibels;
+    double itsDeviation;
+    TurboEncoder itsEncoder;
+    TurboEncoder::Streams itsStreams;
+};
+
+struct Options {
+    unsigned blockSize = 0;
+    int algorithm = 1;
+    unsigned iterations = 8;
+    std::vector<int> milliDecibels;
+    std::uint64_t blockErrors = 300;
+    std::uint64_t maxBlocks = 1000000;
+};
+
+/// Decodes the blocks of a point until the first variant, the best one, has failed often enough. A disagreement is a
+/// block of which a variant and its predecessor decode but one.
+void simulatePoint(const Options& options, int milliDecibels)
+{
+    std::vector<VariantDecoder> decoders;
+    for (const Variant& variant : variants) {
+        // The correction table is for three fraction bits alone.
+        if (options.algorithm != 2 || std::string(variant.stateFormat) == "Fix_12_3") {
+            decoders.emplace_back(variant, options.algorithm);
+        }
+    }
+    const std::size_t skipped = variants.size() - decoders.size();
+    const double scale = defaultScale(options.algorithm, options.blockSize, milliDecibels);
+    std::vector<std::uint64_t> errors(decoders.size());
+    std::vector<std::uint64_t> disagreements(decoders.size());
+    std::vector<bool> failed(decoders.size());
+    ReceivedBlocks blocks(options.blockSize, milliDecibels);
+    std::uint64_t count = 0;
+    for (; count < options.maxBlocks && errors[0] < options.blockErrors; ++count) {
+        blocks.make(count);
+        for (std::size_t i = 0; i < decoders.size(); ++i) {
+            failed[i] = !decoders[i].decodes(blocks.received, scale, options.iterations, blocks.sent);
+            const std::size_t predecessor = std::max(variants[skipped + i].predecessor, skipped) - skipped;
+            errors[i] += failed[i] ? 1U : 0U;
+            disagreements[i] += failed[i] != failed[predecessor] ? 1U : 0U;
+        }
+    }
+    for (std::size_t i = 0; i < decoders.size(); ++i) {
+        std::printf("%u,%s,%d,%u,%.3f,%llu,%llu,%llu\n",
+                    options.blockSize,
+                    variants[skipped + i].name,
+                    options.algorithm,
+                    options.iterations,
+                    milliDecibels / 1000.0,
+                    static_cast<unsigned long long>(count),
+                    static_cast<unsigned long long>(errors[i]),
+                    static_cast<unsigned long long>(disagreements[i]));
+    }
+    std::fflush(stdout);
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    Options options;
+    CLI::App app("Block error rates of variants of the model, as CSV");
+    app.add_option("--block-size", options.blockSize, "Bits of a block, K")->required();
+    app.add_option("--algorithm", options.algorithm, "0, 1 or 2")->check(CLI::Range(0, 2));
+    app.add_option("--iterations", options.iterations, "Turbo iterations, 1 to 15")->check(CLI::Range(1, 15));
+    app.add_option("--ebn0-millidb", options.milliDecibels, "Eb/N0 in thousandths of a decibel")
+        ->delimiter(',')
+        ->required();
+    app.add_option("--block-errors", options.blockErrors, "End a point when the first variant has failed so often");
+    app.add_option("--max-blocks", options.maxBlocks, "End a point with the block N");
+    CLI11_PARSE(app, argc, argv);
+    try {
+        std::puts("block_size,variant,algorithm,iterations,ebn0_db,blocks,block_errors,disagreements");
+        for (const int milliDecibels : options.milliDecibels) {
+            simulatePoint(options, milliDecibels);
+        }
+    } catch (const std::exception& problem) {
+        std::cerr << "morvik_variants: " << problem.what() << '\n';
+        return 2;
+    }
+    return 0;
+}
