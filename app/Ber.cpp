@@ -62,7 +62,11 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
     using simulation::Journal;
     const Interruption interruption;
     std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
-    Journal journal(plan, options.output, options.resume ? Journal::Earlier::resume : Journal::Earlier::refuse);
+    Journal journal(plan,
+                    options.output,
+                    options.resume      ? Journal::Earlier::resume
+                    : options.overwrite ? Journal::Earlier::overwrite
+                                        : Journal::Earlier::refuse);
     const Pictures pictures(options.pictures, options.output);
     if (options.resume && journal.isEmpty()) {
         std::cerr << means.command << ": nothing to resume, starts from the beginning" << std::endl;

@@ -272,8 +272,12 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
             "How much time's work a crash may cost at most, such as 10 or 5m")
         ->type_name("T")
         ->default_str("3");
-    command.add_flag("--resume", options.resume, "Go on where the run with the same parameters was stopped")
-        ->needs(output);
+    CLI::Option* const resume =
+        command.add_flag("--resume", options.resume, "Go on where the run with the same parameters was stopped")
+            ->needs(output);
+    command.add_flag("--overwrite", options.overwrite, "Replace earlier results, finished or not")
+        ->needs(output)
+        ->excludes(resume);
     command.add_flag("--quiet", options.quiet, "Print no table")->needs(output);
     command
         .add_option_function<std::string>(

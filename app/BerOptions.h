@@ -36,6 +36,7 @@ struct BerOptions {
     std::string output;
     double secondsBetweenCheckpoints = 3;
     bool resume = false;
+    bool overwrite = false;
     bool quiet = false;
     PictureOptions pictures;
     std::optional<ReplayedFrame> replay;

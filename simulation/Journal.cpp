@@ -2,6 +2,7 @@
 #include "Journal.h"
 
 #include <filesystem>
+#include <system_error>
 #include <utility>
 
 #include "AtomicFile.h"
@@ -11,6 +12,16 @@
 #include "TextFile.h"
 
 namespace simulation {
+
+namespace {
+
+bool hasContent(const std::string& fileName)
+{
+    std::error_code none;  // if there is no such file
+    return std::filesystem::file_size(fileName, none) > 0 && !none;
+}
+
+}  // namespace
 
 Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     : itsPlan(plan), itsOutput(std::move(output)), itsCheckpoint{plan.version, plan.command, {}, {}}
@@ -26,12 +37,12 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     }
     checkWritable(itsOutput);
     const bool isUnfinished = !itsFile->isNew();
-    if (isUnfinished && earlier == Earlier::refuse) {
-        throw Error(checkpointFile + ": holds an unfinished run; go on with it by --resume, or remove it");
-    }
-    if (isUnfinished) {
+    const bool hasResults = hasContent(itsOutput);
+    if (earlier == Earlier::refuse) {
+        refuseIf(isUnfinished, hasResults);
+    } else if (earlier == Earlier::resume && isUnfinished) {
         resume(checkpointFile);
-    } else if (earlier == Earlier::resume && std::filesystem::exists(itsOutput)) {
+    } else if (earlier == Earlier::resume && hasResults) {
         takeComplete();
     }
 }
@@ -91,11 +102,21 @@ std::string Journal::checkpointName() const
     return itsOutput + ".checkpoint";
 }
 
+void Journal::refuseIf(bool isUnfinished, bool hasResults) const
+{
+    if (isUnfinished) {
+        throw Error(checkpointName() + ": holds an unfinished run; --resume goes on with it, --overwrite starts anew");
+    }
+    if (hasResults) {
+        throw Error(itsOutput + ": is there already; --overwrite replaces it, --resume goes on with the same run");
+    }
+}
+
 void Journal::resume(const std::string& checkpointFile)
 {
     const auto checkpoint = parseCheckpoint(readText(checkpointFile));
     if (!checkpoint) {
-        throw Error(checkpointFile + ": is damaged and cannot be resumed; remove it to start anew");
+        throw Error(checkpointFile + ": is damaged and cannot be resumed; --overwrite starts anew");
     }
     if (checkpoint->version != itsPlan.version) {
         throw Error(checkpointFile + ": holds a run of version " + checkpoint->version + ", this is " +
@@ -111,7 +132,7 @@ void Journal::takeComplete()
 {
     const auto points = pointsOfComplete(itsPlan, readResults(itsOutput));
     if (!points) {
-        throw Error(itsOutput + ": holds other results, and there is no checkpoint to resume; remove it to start anew");
+        throw Error(itsOutput + ": holds other results, and there is no checkpoint to resume; --overwrite starts anew");
     }
     itsCheckpoint.ended = *points;
 }

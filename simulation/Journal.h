@@ -17,9 +17,9 @@ namespace simulation {
 /// there as a whole whenever the process is killed, as they were saved last. All functions throw Error.
 class Journal {
 public:
-    /// What becomes of an earlier run: its checkpoint is in the way, or this run goes on from it. A complete run has no
-    /// checkpoint, but results; going on from there, nothing is left to do.
-    enum class Earlier { refuse, resume };
+    /// What becomes of an earlier run: its checkpoint or its results are in the way, this run goes on from them, or
+    /// takes their place. A complete run has no checkpoint, but results; going on from there, nothing is left to do.
+    enum class Earlier { refuse, resume, overwrite };
 
     /// Opens the journal, for no other run to open it, too, and finds out whether it can be kept. Without an output it
     /// is kept in memory alone. The plan outlives the journal.
@@ -50,6 +50,7 @@ public:
     std::string checkpointName() const;
 
 private:
+    void refuseIf(bool isUnfinished, bool hasResults) const;
     void resume(const std::string& checkpointFile);
     void takeComplete();
 

@@ -57,7 +57,7 @@ TEST_F(JournalFiles, AreACheckpointAtFirst)
 TEST_F(JournalFiles, LeaveEarlierResultsUntilThereAreNewOnes)
 {
     folder.write("results.csv", "of last year");
-    Journal journal(plan, output, Earlier::refuse);
+    Journal journal(plan, output, Earlier::overwrite);
     journal.save(resultOf(0, 10));
     EXPECT_EQ(folder.read("results.csv"), "of last year");
     journal.end(resultOf(0, 20));
@@ -132,7 +132,7 @@ TEST_F(JournalFiles, KeepOtherResultsFromAnAttemptToResume)
     const auto expectRefused = [this] {
         const std::string before = folder.read("results.csv");
         EXPECT_EQ(refusal(Earlier::resume),
-                  output + ": holds other results, and there is no checkpoint to resume; remove it to start anew");
+                  output + ": holds other results, and there is no checkpoint to resume; --overwrite starts anew");
         EXPECT_EQ(folder.read("results.csv"), before);
         EXPECT_EQ(folder.names(), Names{"results.csv"});
     };
@@ -163,7 +163,7 @@ TEST_F(JournalFiles, AreNotLostToAnotherRun)
     }
     const std::string before = folder.read("results.csv.checkpoint");
     EXPECT_EQ(refusal(Earlier::refuse),
-              checkpoint + ": holds an unfinished run; go on with it by --resume, or remove it");
+              checkpoint + ": holds an unfinished run; --resume goes on with it, --overwrite starts anew");
     EXPECT_EQ(folder.read("results.csv.checkpoint"), before);
 }
 
@@ -183,7 +183,7 @@ TEST_F(JournalFiles, OfOtherParametersAreRefused)
 TEST_F(JournalFiles, ThatAreDamagedAreRefused)
 {
     folder.write("results.csv.checkpoint", "morvik checkpoint 0123456789abcdef\n{}\n");
-    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": is damaged and cannot be resumed; remove it to start anew");
+    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": is damaged and cannot be resumed; --overwrite starts anew");
 }
 
 TEST_F(JournalFiles, ThatCannotBeWrittenAreRefusedAtOnce)
@@ -207,7 +207,7 @@ TEST_F(JournalFiles, AreOfOneRunAtATime)
         journal.end(resultOf(0, 20));
         journal.complete();
     }
-    EXPECT_EQ(refusal(Earlier::refuse), "none");
+    EXPECT_EQ(refusal(Earlier::overwrite), "none");
     EXPECT_EQ(folder.names(), Names{"results.csv"});
 }
 
@@ -217,6 +217,32 @@ TEST_F(JournalFiles, AreNotLeftByRunsThatNeverBegan)
     EXPECT_EQ(folder.names(), Names{});
     folder.write("results.csv.checkpoint", "");  // of a run that was killed when it had just taken it
     EXPECT_EQ(refusal(Earlier::refuse), "none");
+}
+
+TEST_F(JournalFiles, DoNotTakeThePlaceOfResultsUnasked)
+{
+    folder.write("results.csv", "of last year");
+    EXPECT_EQ(refusal(Earlier::refuse),
+              output + ": is there already; --overwrite replaces it, --resume goes on with the same run");
+    EXPECT_EQ(folder.read("results.csv"), "of last year");
+    EXPECT_EQ(folder.names(), Names{"results.csv"});
+    EXPECT_EQ(refusal(Earlier::overwrite), "none");
+    folder.write("results.csv", "");
+    EXPECT_EQ(refusal(Earlier::refuse), "none") << "there is nothing to lose";
+    EXPECT_EQ(refusal(Earlier::resume), "none");
+}
+
+TEST_F(JournalFiles, CanBeOverwrittenBeforeTheyAreFinished)
+{
+    {
+        Journal journal(plan, output, Earlier::refuse);
+        journal.end(resultOf(0, 10));
+        journal.save(resultOf(1, 10));
+    }
+    Journal journal(plan, output, Earlier::overwrite);
+    EXPECT_TRUE(journal.isEmpty());
+    journal.begin();
+    EXPECT_EQ(journal.resultSoFar(1).tally.blocks, 0U);
 }
 
 }  // namespace

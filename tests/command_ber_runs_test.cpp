@@ -147,7 +147,7 @@ TEST_F(BerRuns, EndBySignalsWithACheckpoint)
 {
     const std::string expected = berFile(longPoint, "expected.csv");
     for (const int signal : {SIGINT, SIGTERM, SIGHUP}) {
-        Process process = start(longPoint);
+        Process process = start(longPoint + Arguments{"--overwrite"});
         ASSERT_TRUE(waitForCheckpoint("\"running\""));
         process.send(signal);
         EXPECT_EQ(process.wait(), 128 + signal);
@@ -254,7 +254,7 @@ TEST_F(BerRuns, ResumeNoOtherRun)
     const std::string kept = checkpoint();
     const Arguments again = Arguments{"ber", "--quiet", "--output", "results.csv"} + longPoint;
     const std::string place = "morvik ber: results.csv.checkpoint: ";
-    expectRefused(again, place + "holds an unfinished run; go on with it by --resume, or remove it");
+    expectRefused(again, place + "holds an unfinished run; --resume goes on with it, --overwrite starts anew");
     for (const Arguments& other : {words("--seed 2"),
                                    words("--scale 8"),
                                    words("--num-pu 2"),
@@ -271,7 +271,7 @@ TEST_F(BerRuns, ResumeNoOtherRun)
     for (const std::string& damaged : {kept.substr(0, kept.size() / 2), kept + "x", std::string("\n")}) {
         morvik.write("results.csv.checkpoint", damaged);
         expectRefused(again + Arguments{"--resume"},
-                      place + "is damaged and cannot be resumed; remove it to start anew");
+                      place + "is damaged and cannot be resumed; --overwrite starts anew");
         EXPECT_EQ(checkpoint(), damaged);
     }
 }
@@ -299,9 +299,24 @@ TEST_F(BerRuns, ResumeACompleteRunWithoutSimulatingAnything)
     EXPECT_EQ(morvik.read("a.csv"), results);
     expectRefused(
         run + words("--resume --seed 2"),
-        "morvik ber: a.csv: holds other results, and there is no checkpoint to resume; remove it to start anew");
+        "morvik ber: a.csv: holds other results, and there is no checkpoint to resume; --overwrite starts anew");
     EXPECT_EQ(morvik.read("a.csv"), results);
     EXPECT_EQ(morvik.names(), Arguments{"a.csv"});
+}
+
+TEST_F(BerRuns, ReplaceResultsOnlyWhenTheyAreAskedTo)
+{
+    const Arguments run = words("ber --block-size 40 --ebn0 0 --max-blocks 10 --output a.csv --seed");
+    EXPECT_EQ(morvik.run(run + Arguments{"1"}).status, 0);
+    const std::string results = morvik.read("a.csv");
+    expectRefused(run + Arguments{"2"},
+                  "morvik ber: a.csv: is there already; --overwrite replaces it, --resume goes on with the same run");
+    EXPECT_EQ(morvik.read("a.csv"), results);
+    EXPECT_EQ(morvik.run(run + Arguments{"2", "--overwrite"}).status, 0);
+    EXPECT_EQ(csvRows(morvik.read("a.csv"))[0].at("seed"), "2");
+    const CommandResult both = morvik.run(run + Arguments{"2", "--overwrite", "--resume"});
+    EXPECT_EQ(both.status, 2);
+    EXPECT_EQ(both.err, "morvik ber: --resume excludes --overwrite; 'morvik ber --help' tells what is allowed\n");
 }
 
 // ---- Runs in parts

@@ -92,8 +92,9 @@ protected:
     /// Runs `morvik-mpi ber` on so many ranks with an output file, and returns that without times.
     std::string mpiFile(int count, const Arguments& arguments, const std::string& output) const
     {
-        const CommandResult result =
-            mpirun.run(ranks(count) + Arguments{"ber", "--quiet", "--output", output} + arguments);
+        const bool resumes = std::find(arguments.begin(), arguments.end(), "--resume") != arguments.end();
+        const CommandResult result = mpirun.run(ranks(count) + Arguments{"ber", "--quiet", "--output", output} +
+                                                arguments + (resumes ? Arguments{} : Arguments{"--overwrite"}));
         EXPECT_EQ(result.status, 0) << result.err;
         EXPECT_EQ(result.err, "");
         EXPECT_EQ(result.out, "");
@@ -124,7 +125,7 @@ protected:
             open((mpirun.directory() + "/.messages").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
         const int streams[] = {silent, silent, messages};
         Process process(mpirun.program(),
-                        mpirunOptions + ranks(3) + words("ber --quiet --output results.csv") + arguments,
+                        mpirunOptions + ranks(3) + words("ber --quiet --overwrite --output results.csv") + arguments,
                         mpirun.directory(),
                         streams);
         close(silent);
@@ -267,6 +268,17 @@ TEST_F(MpiRuns, EndBySignalsToRankZero)
     EXPECT_TRUE(isCounting());
     EXPECT_EQ(
         mpirun.read(".messages").find("morvik-mpi ber: interrupted, --resume goes on from results.csv.checkpoint"), 0U);
+}
+
+TEST_F(MpiRuns, HaveTheirOutputForThemselves)
+{
+    Process process = start(longerPoint + neverSaved);
+    ASSERT_TRUE(comesTrue([this] { return !checkpoint().empty(); }));
+    expectRefusedOnce(
+        ranks(2) + words("ber --output results.csv --resume") + longerPoint,
+        "morvik-mpi ber: results.csv: another run is writing it; wait for that to end, or choose another name");
+    ASSERT_EQ(kill(processOf(process.id(), 0), SIGTERM), 0);
+    EXPECT_EQ(process.wait(), 128 + SIGTERM);
 }
 
 // ---- What is refused

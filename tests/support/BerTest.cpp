@@ -1,6 +1,7 @@
 // BerTest: what the tests of `morvik ber` share.
 #include "BerTest.h"
 
+#include <algorithm>
 #include <regex>
 #include <sstream>
 
@@ -72,7 +73,9 @@ std::string BerTest::ber(const Arguments& arguments) const
 
 std::string BerTest::berFile(const Arguments& arguments, const std::string& output) const
 {
-    EXPECT_EQ(ber(arguments + Arguments{"--quiet", "--output", output}), "");
+    const bool resumes = std::find(arguments.begin(), arguments.end(), "--resume") != arguments.end();
+    const Arguments overwrite = resumes ? Arguments{} : Arguments{"--overwrite"};
+    EXPECT_EQ(ber(arguments + Arguments{"--quiet", "--output", output} + overwrite), "");
     return withoutTimes(morvik.read(output));
 }
 

@@ -31,7 +31,7 @@ protected:
     /// Runs `morvik ber`, and expects that it succeeds. Returns what it printed.
     std::string ber(const Arguments& arguments) const;
 
-    /// Runs `morvik ber` with an output file, and returns that without times.
+    /// Runs `morvik ber` with an output file, whatever it was before, and returns that without times.
     std::string berFile(const Arguments& arguments, const std::string& output = "results.csv") const;
 
     /// Runs the command, and expects that it is refused in this one line.
