@@ -85,7 +85,8 @@ public:
         tryScale(diagnosis);
         diagnosis.appearance = appearanceOf(undone(itsCases, diagnosis.best.mistakes));
         diagnosis.stranger = strangerOf(diagnosis.appearance);
-        diagnosis.clipped = clippedValues();
+        diagnosis.clipped = valuesThat([](std::int32_t value) { return value < -128 || value > 127; });
+        diagnosis.hasNegative = valuesThat([](std::int32_t value) { return value < 0; }) > 0;
         judge(asIs, diagnosis);
         return diagnosis;
     }
@@ -208,13 +209,13 @@ private:
         }
     }
 
-    std::uint64_t clippedValues() const
+    template <class Condition>
+    std::uint64_t valuesThat(Condition condition) const
     {
         std::uint64_t count = 0;
         for (const Case& block : itsCases) {
             for (const auto* stream : {&block.received.rsc1Sys, &block.received.rsc1Par, &block.received.rsc2Par}) {
-                count += static_cast<std::uint64_t>(std::count_if(
-                    stream->begin(), stream->end(), [](std::int32_t value) { return value < -128 || value > 127; }));
+                count += static_cast<std::uint64_t>(std::count_if(stream->begin(), stream->end(), condition));
             }
         }
         return count;

@@ -49,6 +49,7 @@ struct Diagnosis {
     Appearance appearance;                ///< once they are undone
     std::optional<std::size_t> stranger;  ///< the stream that has nothing to do with the bits
     std::uint64_t clipped = 0;            ///< values of the file beyond -128 ... 127
+    bool hasNegative = true;              ///< whether any value of the file is negative
     std::optional<Noise> noise;           ///< where blocks fail
 };
 

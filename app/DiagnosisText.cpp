@@ -204,6 +204,9 @@ std::string textOf(const Diagnosis& diagnosis)
     if (diagnosis.verdict != Verdict::unrelated) {
         text += appearanceText(diagnosis);
     }
+    if (!diagnosis.hasNegative) {
+        text += "No value is negative, as half of them should be: these are hard bits, or were taken for unsigned.\n";
+    }
     return text;
 }
 

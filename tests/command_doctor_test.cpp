@@ -99,6 +99,24 @@ TEST_F(Doctor, TellsThatTheBitsAreNotThoseOfTheBlock)
     EXPECT_FALSE(has(result.out, "Found: ")) << result.out;
 }
 
+TEST_F(Doctor, TellsThatNoValueIsNegative)
+{
+    const std::string hint =
+        "No value is negative, as half of them should be: these are hard bits, or were taken for "
+        "unsigned.\n";
+    std::vector<SentFrame> frames = sentFrames(512, 2, 6, 1);
+    EXPECT_FALSE(has(examine(frames).out, hint));
+    for (SentFrame& frame : frames) {
+        for (auto* stream : {&frame.soft.sys, &frame.soft.par1, &frame.soft.par2}) {
+            for (auto& value : *stream) {
+                value = value < 0 ? 0 : 1;
+            }
+        }
+    }
+    const CommandResult result = examine(frames);
+    EXPECT_TRUE(has(result.out, hint)) << result.out;
+}
+
 TEST_F(Doctor, WritesJson)
 {
     std::vector<SentFrame> frames = sentFrames(104, 2, 6, 1);
