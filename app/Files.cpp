@@ -1,6 +1,7 @@
 // Files: the files and standard streams that a command reads and writes, and what can go wrong with them.
 #include "Files.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <filesystem>
 #include <iostream>
@@ -32,10 +33,10 @@ std::string cannotBe(const std::string& action)
 
 void expectOwnFile(const std::string& path, const std::vector<std::string>& inputs, const std::string& content)
 {
-    for (const std::string& input : inputs) {
-        if (isSameFile(path, input)) {
-            throw FileError(path, "is read as " + input + ", " + content + " need a file of their own");
-        }
+    const auto same = std::find_if(
+        inputs.begin(), inputs.end(), [&path](const std::string& input) { return isSameFile(path, input); });
+    if (same != inputs.end()) {
+        throw FileError(path, "is read as " + *same + ", " + content + " need a file of their own");
     }
 }
 

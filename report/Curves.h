@@ -43,7 +43,7 @@ struct Curve {
     std::string title;
     bool reference = false;  // to compare with: drawn dashed, after the others in the legend
     std::vector<Sample> samples;
-    std::string family = "";  // the title that it shares with the curves that differ in one number alone, which ascends
+    std::string family = {};  // the title that it shares with the curves that differ in one number alone, which ascends
 };
 
 /// What a point was simulated with. Zero and the empty text stand for what is not known.
