@@ -249,18 +249,25 @@ TEST_F(CommandTrace, RefusesWhatIsNotAllowed)
 {
     const std::string help = "; 'morvik trace --help' tells what is allowed";
     const std::string k40 = vectors("k40.csv");
-    const std::string range =
-        " is not allowed, allowed are N and A:B, A not above B, from 0 to 3 (two for each of "
-        "--iterations)";
-    for (const std::string wrong : {"4", "0:4", "2:1", "a", "1:", ":1", "0:1:2", "-1"}) {
+    const auto expectNoRange = [&](const std::string& wrong) {
         expectRefused({k40, "--iterations", "2", "--half-iterations=" + wrong},
-                      "--half-iterations: \"" + wrong + '"' + range);
+                      "--half-iterations: \"" + wrong +
+                          "\" is not allowed, allowed are N and A:B, A not above B, from 0 to 3 (two for each of "
+                          "--iterations)");
+    };
+    for (const char* const wrong : {"4", "0:4", "2:1", "a", "1:", ":1", "0:1:2", "-1"}) {
+        expectNoRange(wrong);
     }
-    const std::string known =
-        " is not allowed, known are intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to beta7 (beta), "
-        "llr, extrinsic";
-    for (const std::string wrong : {"gamma", "alpha8", "g4", "ll"}) {
-        expectRefused({k40, "--format", "csv", "--signals=" + wrong}, "--signals: \"" + wrong + '"' + known + help);
+    const auto expectNoSignal = [&](const std::string& wrong) {
+        expectRefused(
+            {k40, "--format", "csv", "--signals=" + wrong},
+            "--signals: \"" + wrong +
+                "\" is not allowed, known are intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to "
+                "beta7 (beta), llr, extrinsic" +
+                help);
+    };
+    for (const char* const wrong : {"gamma", "alpha8", "g4", "ll"}) {
+        expectNoSignal(wrong);
     }
     expectRefused({k40, "--format", "csv", "--signals", "alpha,alpha3"},
                   "--signals: \"alpha3\" is not allowed, it has been given before" + help);
