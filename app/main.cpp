@@ -3,6 +3,7 @@
 
 #include "Ber.h"
 #include "CommandLine.h"
+#include "Compare.h"
 #include "Decode.h"
 #include "Doctor.h"
 #include "Info.h"
@@ -26,6 +27,7 @@ int main(int argc, char** argv)
                                       morvik::addMerge(app),
                                       morvik::addVectors(app),
                                       morvik::addTrace(app),
+                                      morvik::addCompare(app),
                                       morvik::addDoctor(app),
                                       morvik::addInfo(app),
                                       morvik::addSelfTest(app),

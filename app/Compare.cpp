@@ -1,0 +1,133 @@
+// Compare: the subcommand that finds where a simulation of hardware leaves the model.
+#include "Compare.h"
+
+#include <iostream>
+#include <memory>
+#include <string>
+
+#include "Arguments.h"
+#include "DecoderOptions.h"
+#include "Files.h"
+#include "SoftValueReader.h"
+#include "comparison/Comparison.h"
+#include "comparison/Dump.h"
+#include "comparison/Model.h"
+#include "comparison/NameMap.h"
+#include "comparison/Report.h"
+#include "simulation/Error.h"
+#include "standard/BlockSizes.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::string block;
+    std::uint32_t number = 0;
+    std::string dump;
+    std::string map;
+    std::string form;
+    DecoderOptions decoder;
+};
+
+/// The block of this number in the file, from 0.
+SoftBlock readBlock(const std::string& file, std::uint32_t number)
+{
+    InputFile input(file);
+    SoftValueReader reader(input.stream(), input.name());
+    SoftBlock block;
+    for (std::uint32_t i = 0; i <= number; ++i) {
+        if (!reader.next(block)) {
+            throw FileError(input.name(),
+                            "has " + std::to_string(i) + (i == 1 ? " block" : " blocks") + ", there is no block " +
+                                std::to_string(number));
+        }
+    }
+    if (block.size() < tailPositions ||
+        standard::findBlockSize(static_cast<std::uint32_t>(block.size() - tailPositions)) == nullptr) {
+        reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
+    }
+    return block;
+}
+
+comparison::NameMap readMap(const std::string& file)
+{
+    if (file.empty()) {
+        return {};
+    }
+    InputFile input(file);
+    return comparison::readNameMap(input.stream(), input.name());
+}
+
+/// Whether the dump is a VCD: by the option, or by the end of the file's name.
+bool isVcd(const Options& options)
+{
+    const std::string ending = ".vcd";
+    const std::string& name = options.dump;
+    return options.form.empty()
+               ? name.size() > ending.size() && name.compare(name.size() - ending.size(), ending.size(), ending) == 0
+               : options.form == "vcd";
+}
+
+int compare(const Options& options)
+{
+    const SoftBlock block = readBlock(options.block, options.number);
+    const comparison::NameMap map = readMap(options.map);
+    const comparison::Model model(block, options.decoder.generics, options.decoder.iterations);
+    comparison::Dump dump(model.values.passes(), model.values.steps());
+    InputFile input(options.dump);
+    (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);
+    const comparison::Comparison found = comparison::compare(model, dump.values);
+    if (found.compared() == 0) {
+        throw FileError(input.name(), "holds no value that the core computes");
+    }
+    std::cout << comparison::textOf(found, model, dump, input.name()) << std::flush;
+    if (!std::cout) {
+        throw FileError("<stdout>", cannotBe("written"));
+    }
+    return found.first ? differencesFound : success;
+}
+
+constexpr char explanation[] = R"(
+A dump has the values of a simulation of hardware: CSV with the columns half_iteration, step,
+signal and value, or a VCD in whose scopes half_iteration and step say what the others belong
+to. Signals are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr and extrinsic;
+those that it lacks are not compared. MAP is a JSON object that tells other names and forms
+of numbers; docs/compare.md has examples.
+
+Exit status: 0 all values agree, 1 a difference was found, 2 bad input or usage.
+
+Example:
+  morvik compare --block k40.csv --num-pu 8 --dump rtl.csv --map names.json)";
+
+}  // namespace
+
+Command addCompare(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("compare", "Find where a simulation of hardware leaves the model");
+    const auto options = std::make_shared<Options>();
+
+    command->add_option("--block", options->block, "Soft values, as 'morvik decode' takes them")
+        ->type_name("FILE")
+        ->required();
+    command->add_option("--block-number", options->number, "Which block of the file, from 0")
+        ->transform(integerFrom(0, UINT32_MAX - 1))
+        ->type_name("N")
+        ->capture_default_str();
+    command->add_option("--dump", options->dump, "Values of the simulation, as CSV or VCD")
+        ->type_name("FILE")
+        ->required();
+    command->add_option("--map", options->map, "Names and forms of numbers in the dump, as JSON")->type_name("FILE");
+    command->add_option("--format", options->form, "csv or vcd; otherwise as the name of the dump ends")
+        ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
+        ->type_name("FORMAT");
+    addDecoderOptions(*command, options->decoder);
+    command->footer(explanation);
+
+    const auto run = [options] {
+        return compare(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik

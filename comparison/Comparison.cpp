@@ -1,0 +1,214 @@
+// Comparison: where a dump leaves the model, and which values are wrong by themselves.
+#include "Comparison.h"
+
+namespace morvik::comparison {
+
+namespace {
+
+/// Faults beyond these are counted, but not looked at: patterns show earlier.
+constexpr std::size_t mostFaults = 20000;
+
+class Comparer {
+public:
+    Comparer(const Model& model, const Values& dump) : itsModel(model), itsDump(dump), itsReplay(model, dump) {}
+
+    Comparison compare()
+    {
+        for (unsigned pass = 0; pass < itsDump.passes(); ++pass) {
+            for (const Stage stage : stages) {
+                for (const unsigned step : stepsInOrder(itsModel.division, stage)) {
+                    compareColumn(pass, stage, step);
+                }
+            }
+        }
+        if (itsResult.faults.empty() && itsResult.first) {
+            itsResult.inputsAreKnown = false;
+            takeFirstStage();
+        }
+        if (itsResult.first) {
+            itsResult.inputs = inputsOf(itsModel, *itsResult.first);
+            for (InputState& input : itsResult.inputs) {
+                lookAt(input);
+            }
+        }
+        return itsResult;
+    }
+
+private:
+    bool isInDump(unsigned pass, Stage stage, unsigned step) const
+    {
+        const auto [first, count] = signalsOf(stage);
+        for (unsigned i = 0; i < count; ++i) {
+            if (itsDump.has({pass, first + i, step})) {
+                return true;
+            }
+        }
+        return false;
+    }
+
+    void compareColumn(unsigned pass, Stage stage, unsigned step)
+    {
+        if (!isInDump(pass, stage, step)) {
+            return;
+        }
+        const Column follows = itsReplay.column(pass, stage, step);
+        const auto [first, count] = signalsOf(stage);
+        for (unsigned i = 0; i < count; ++i) {
+            const Place place = {pass, first + i, step};
+            if (itsDump.has(place)) {
+                compareValue(place, follows.values[i], follows.complete);
+            }
+        }
+    }
+
+    void compareValue(const Place& place, std::int16_t wanted, bool complete)
+    {
+        SignalCount& count = itsResult.signals[place.signal];
+        ++count.compared;
+        const std::int16_t got = itsDump.at(place);
+        if (got != itsModel.values.at(place)) {
+            ++count.different;
+            if (!count.first) {
+                count.first = place;
+            }
+            if (!itsResult.first) {
+                itsResult.first = place;
+            }
+        }
+        if (complete && got != wanted) {
+            ++count.faults;
+            if (itsResult.faults.size() < mostFaults) {
+                itsResult.faults.push_back({place, got, wanted});
+            }
+        }
+    }
+
+    void takeFirstStage()
+    {
+        const Stage stage = stageOf(itsResult.first->signal);
+        const auto [first, count] = signalsOf(stage);
+        const unsigned pass = itsResult.first->pass;
+        for (const unsigned step : stepsInOrder(itsModel.division, stage)) {
+            for (unsigned i = 0; i < count; ++i) {
+                const Place place = {pass, first + i, step};
+                if (itsDump.has(place) && itsDump.at(place) != itsModel.values.at(place)) {
+                    itsResult.faults.push_back({place, itsDump.at(place), itsModel.values.at(place)});
+                }
+            }
+        }
+    }
+
+    void lookAt(InputState& input) const
+    {
+        const auto [first, count] = signalsOf(input.stage);
+        for (unsigned i = 0; i < count; ++i) {
+            const Place place = {input.pass, first + i, input.step};
+            if (itsDump.has(place)) {
+                ++input.present;
+                input.different += itsDump.at(place) != itsModel.values.at(place) ? 1U : 0U;
+            }
+        }
+    }
+
+    const Model& itsModel;
+    const Values& itsDump;
+    Replay itsReplay;
+    Comparison itsResult;
+};
+
+InputState inputAt(Stage stage, unsigned pass, unsigned step)
+{
+    InputState input{};
+    input.stage = stage;
+    input.pass = pass;
+    input.step = step;
+    return input;
+}
+
+/// A recursion's column follows from one column and its branch metrics.
+std::vector<InputState> columnInputs(Stage stage, unsigned pass, unsigned step)
+{
+    return {inputAt(stage, pass, step), inputAt(Stage::branch, pass, step)};
+}
+
+std::vector<InputState> forwardInputs(const Division& division, const Place& place)
+{
+    if (place.step == 0) {
+        return {};
+    }
+    const bool isStart = place.step < division.K && place.step % division.segmentLength == 0;
+    if (isStart && place.pass < 2) {
+        return {};
+    }
+    return columnInputs(Stage::forward, isStart ? place.pass - 2 : place.pass, place.step - 1);
+}
+
+std::vector<InputState> backwardInputs(const Division& division, const Place& place)
+{
+    const Window& window = division.windowAt(place.step);
+    if (place.step < window.last) {
+        return columnInputs(Stage::backward, place.pass, place.step + 1);
+    }
+    if (division.isFinal(window) || place.pass < 2) {
+        return {};
+    }
+    const bool ofThisPass = division.rows >= 3 && window.row + 1 == division.rows;  // rule 20
+    return columnInputs(Stage::backward, ofThisPass ? place.pass : place.pass - 2, place.step + 1);
+}
+
+template <std::uint64_t SignalCount::*member>
+std::uint64_t sum(const std::array<SignalCount, signalCount>& signals)
+{
+    std::uint64_t total = 0;
+    for (const SignalCount& each : signals) {
+        total += each.*member;
+    }
+    return total;
+}
+
+}  // namespace
+
+std::vector<InputState> inputsOf(const Model& model, const Place& place)
+{
+    switch (stageOf(place.signal)) {
+    case Stage::intrinsic:
+        if (place.pass == 0 || place.step >= model.division.K) {
+            return {};
+        }
+        return {inputAt(Stage::extrinsic, place.pass - 1, model.codes[codeOf(place.pass)].order[place.step])};
+    case Stage::branch:
+        return {inputAt(Stage::intrinsic, place.pass, place.step)};
+    case Stage::forward:
+        return forwardInputs(model.division, place);
+    case Stage::backward:
+        return backwardInputs(model.division, place);
+    case Stage::ratio:
+        return {inputAt(Stage::forward, place.pass, place.step),
+                inputAt(Stage::backward, place.pass, place.step),
+                inputAt(Stage::branch, place.pass, place.step)};
+    default:
+        return {inputAt(Stage::ratio, place.pass, place.step), inputAt(Stage::intrinsic, place.pass, place.step)};
+    }
+}
+
+std::uint64_t Comparison::compared() const
+{
+    return sum<&SignalCount::compared>(signals);
+}
+
+std::uint64_t Comparison::different() const
+{
+    return sum<&SignalCount::different>(signals);
+}
+
+std::uint64_t Comparison::allFaults() const
+{
+    return sum<&SignalCount::faults>(signals);
+}
+
+Comparison compare(const Model& model, const Values& dump)
+{
+    return Comparer(model, dump).compare();
+}
+
+}  // namespace morvik::comparison

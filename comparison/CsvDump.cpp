@@ -1,0 +1,164 @@
+// CsvDump: dumps as comma-separated values.
+#include <algorithm>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Dump.h"
+#include "DumpFile.h"
+#include "simulation/Shown.h"
+
+namespace morvik::comparison {
+
+namespace {
+
+using simulation::shown;
+
+std::string_view field(std::string_view row, std::size_t number)
+{
+    for (; number > 0; --number) {
+        const std::size_t comma = row.find(',');
+        row.remove_prefix(comma == std::string_view::npos ? row.size() : comma + 1);
+    }
+    row = row.substr(0, row.find(','));
+    row.remove_prefix(std::min(row.find_first_not_of(' '), row.size()));
+    return row.substr(0, row.find_last_not_of(' ') + 1);
+}
+
+std::size_t fieldsOf(std::string_view row)
+{
+    return static_cast<std::size_t>(std::count(row.begin(), row.end(), ',')) + 1;
+}
+
+std::optional<std::size_t> findColumn(std::string_view header, std::string_view name)
+{
+    const std::size_t count = fieldsOf(header);
+    for (std::size_t i = 0; i < count; ++i) {
+        if (field(header, i) == name) {
+            return i;
+        }
+    }
+    return std::nullopt;
+}
+
+/// Reads rows of a value each, which name the signal, or rows with a column for each signal.
+class CsvReader {
+public:
+    CsvReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
+        : itsFile(input, name), itsMap(map), itsDump(dump)
+    {
+    }
+
+    void read()
+    {
+        if (!itsFile.next()) {
+            itsFile.fail("no header, expected the columns half_iteration, step, signal, value");
+        }
+        readHeader();
+        while (itsFile.next()) {
+            if (!itsFile.line().empty()) {
+                readRow();
+            }
+        }
+    }
+
+private:
+    struct SignalColumn {
+        std::string name;
+        unsigned signal;
+        std::size_t column;
+    };
+
+    void readHeader()
+    {
+        const std::string_view header = itsFile.line();
+        itsPass = needColumn(itsMap.passColumn);
+        itsStep = needColumn(itsMap.stepColumn);
+        itsFields = fieldsOf(header);
+        itsSignal = findColumn(header, itsMap.signalColumn);
+        if (itsSignal) {
+            itsValue = needColumn(itsMap.valueColumn);
+            return;
+        }
+        for (std::size_t i = 0; i < itsFields; ++i) {
+            const std::string name(field(header, i));
+            const auto signal = itsMap.signal(name);
+            if (signal && *signal != NameMap::leftOut) {
+                itsColumns.push_back({name, *signal, i});
+            }
+        }
+        if (itsColumns.empty()) {
+            needColumn(itsMap.signalColumn);
+        }
+    }
+
+    std::size_t needColumn(const std::string& name) const
+    {
+        const auto found = findColumn(itsFile.line(), name);
+        if (!found) {
+            itsFile.fail("no column " + shown(name) + " in the header " + shown(itsFile.line()));
+        }
+        return *found;
+    }
+
+    void readRow()
+    {
+        const std::string_view row = itsFile.line();
+        if (fieldsOf(row) != itsFields) {
+            itsFile.fail(std::to_string(fieldsOf(row)) + " fields, expected the " + std::to_string(itsFields) +
+                         " of the header");
+        }
+        if (!itsSignal) {
+            for (const SignalColumn& each : itsColumns) {
+                take(each.name, each.signal, field(row, each.column));
+            }
+            return;
+        }
+        const std::string_view name = field(row, *itsSignal);
+        const auto signal = itsMap.signal(name);
+        if (!signal) {
+            itsFile.fail("signal " + shown(name) + " is not known; a map tells which it is, or that it does not count");
+        }
+        if (*signal != NameMap::leftOut) {
+            take(name, *signal, field(row, itsValue));
+        }
+    }
+
+    void take(std::string_view name, unsigned signal, std::string_view text)
+    {
+        if (text.empty() || text == "x" || text == "X") {
+            return;  // unknown
+        }
+        const std::string_view row = itsFile.line();
+        const Place place = {
+            itsFile.count("half-iteration", field(row, itsPass), itsMap.firstPass, itsDump.values.passes()),
+            signal,
+            itsFile.count("step", field(row, itsStep), itsMap.firstStep, itsDump.values.steps())};
+        const std::int16_t value = itsFile.value(name, text, itsMap);
+        if (itsDump.values.has(place)) {
+            itsFile.fail(std::string(name) + " of this half-iteration and step stands in line " +
+                         std::to_string(itsDump.lineOf(place)) + ", too");
+        }
+        itsDump.values.set(place, value);
+        itsDump.lineOf(place) = itsFile.number();
+    }
+
+    DumpFile itsFile;
+    const NameMap& itsMap;
+    Dump& itsDump;
+    std::size_t itsPass = 0;
+    std::size_t itsStep = 0;
+    std::size_t itsFields = 0;
+    std::optional<std::size_t> itsSignal;  // nothing when each signal has a column
+    std::size_t itsValue = 0;
+    std::vector<SignalColumn> itsColumns;
+};
+
+}  // namespace
+
+void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
+{
+    CsvReader(input, name, map, dump).read();
+}
+
+}  // namespace morvik::comparison

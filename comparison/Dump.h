@@ -1,0 +1,49 @@
+// Dump: the values that a simulation of hardware wrote.
+#ifndef MORVIK_COMPARISON_DUMP_H
+#define MORVIK_COMPARISON_DUMP_H
+
+#include <cstdint>
+#include <istream>
+#include <map>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "NameMap.h"
+#include "Values.h"
+
+namespace morvik::comparison {
+
+/// Values and the lines they come from.
+struct Dump {
+    Dump(unsigned passes, unsigned steps) : values(passes, steps), lines(std::size_t{passes} * signalCount * steps, 0)
+    {
+    }
+
+    std::uint32_t& lineOf(const Place& place)
+    {
+        return lines[values.index(place)];
+    }
+
+    std::uint32_t lineOf(const Place& place) const
+    {
+        return lines[values.index(place)];
+    }
+
+    Values values;
+    std::vector<std::uint32_t> lines;
+};
+
+/// Reads CSV: a header with the columns half_iteration, step, signal and value in any order, or, for the last two, a
+/// column for each signal; the map may call them otherwise, and other columns are left alone. An empty value or x is
+/// not known and does not count. What is wrong is thrown as a simulation::Error that opens with the place.
+void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
+
+/// Reads a value change dump. In each scope with signals, half_iteration and step (in the scope or one around it) tell
+/// what the signals' values belong to, at the end of each time at which the scope has changed; what is not known (x or
+/// z) does not count. What is wrong is thrown as a simulation::Error that opens with the place.
+void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
+
+}  // namespace morvik::comparison
+
+#endif

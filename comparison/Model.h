@@ -1,0 +1,81 @@
+// Model: every value that the core computes on a block, and how it cuts the block.
+#ifndef MORVIK_COMPARISON_MODEL_H
+#define MORVIK_COMPARISON_MODEL_H
+
+#include <array>
+#include <cstdint>
+#include <vector>
+
+#include "Values.h"
+#include "morvik_v1_0_bitacc_cmodel.h"
+#include "testbench/SoftBlock.h"
+
+namespace morvik::comparison {
+
+/// A window of the backward recursion: trellis steps.
+struct Window {
+    unsigned segment;
+    unsigned row;  ///< which window of its segment
+    unsigned first;
+    unsigned last;
+};
+
+/// How a block is cut (docs/arithmetic.md, rules 17 and 18).
+struct Division {
+    unsigned K = 0;
+    unsigned numPu = 0;
+    unsigned segments = 0;
+    unsigned segmentLength = 0;
+    unsigned rows = 0;
+    std::vector<Window> windows;     ///< in the order in which they are computed
+    std::vector<unsigned> windowOf;  ///< the window of each of the K steps
+
+    /// Neighbouring segments share a unit.
+    unsigned unitOf(unsigned segment) const
+    {
+        return segment / (segments > numPu ? segments / numPu : 1);
+    }
+
+    const Window& windowAt(unsigned step) const
+    {
+        return windows[windowOf[step]];
+    }
+
+    /// Whether no window follows: its backward recursion starts from the tail.
+    bool isFinal(const Window& window) const
+    {
+        return window.last + 1 == K;
+    }
+};
+
+/// The streams and permutations of the two constituent codes: 0 natural, 1 interleaved. Soft values are aligned words
+/// of the state format, K + 3 of them.
+struct Code {
+    std::vector<short> systematic;
+    std::vector<short> parity;
+    std::vector<unsigned> order;  ///< entry j is the place in the other code's order of what step j works on
+};
+
+/// The constituent code of a half-iteration (rule 15).
+constexpr unsigned codeOf(unsigned pass)
+{
+    return pass % 2 == 0 ? 1 : 0;
+}
+
+struct Model {
+    /// Decodes the block by the components. Throws morvik::Refusal when the library refuses.
+    Model(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, unsigned iterations);
+
+    veltra_ip_morvik_v1_0_generics generics;
+    Division division;
+    std::array<Code, 2> codes;
+    Values values;  ///< those that the core computes, and no others
+};
+
+/// The steps of a stage in the order in which the core computes them: the segments at the same time, the backward
+/// recursion window by window from its end.
+std::vector<unsigned> stepsInOrder(const Division& division, Stage stage);
+
+}  // namespace morvik::comparison
+
+#endif

@@ -1,0 +1,241 @@
+// NameMap: what a dump calls its signals and how it writes numbers.
+#include "NameMap.h"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <cmath>
+#include <nlohmann/json.hpp>
+#include <sstream>
+#include <system_error>
+#include <utility>
+
+#include "Values.h"
+#include "simulation/Error.h"
+#include "simulation/Shown.h"
+
+namespace morvik::comparison {
+
+namespace {
+
+using Json = nlohmann::json;
+using simulation::shown;
+
+constexpr std::array<std::pair<const char*, NumberForm>, 6> numberForms = {{{"auto", NumberForm::automatic},
+                                                                            {"integer", NumberForm::integer},
+                                                                            {"unsigned", NumberForm::unsignedInteger},
+                                                                            {"real", NumberForm::real},
+                                                                            {"hex", NumberForm::hexadecimal},
+                                                                            {"binary", NumberForm::binary}}};
+
+std::optional<std::int64_t> integer(std::string_view text, int base)
+{
+    std::int64_t value = 0;
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value, base);
+    return result.ec == std::errc() && result.ptr == end ? std::optional<std::int64_t>(value) : std::nullopt;
+}
+
+/// A real number that is a multiple of an eighth.
+std::optional<std::int64_t> eighths(std::string_view text)
+{
+    double value = 0;
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value);
+    const double scaled = 8 * value;
+    if (result.ec != std::errc() || result.ptr != end || !(std::abs(scaled) < 1e9) || scaled != std::floor(scaled)) {
+        return std::nullopt;
+    }
+    return static_cast<std::int64_t>(scaled);
+}
+
+std::optional<std::int64_t> complement(std::optional<std::int64_t> digits, unsigned bits)
+{
+    if (!digits || *digits < 0 || *digits >> bits != 0) {
+        return std::nullopt;
+    }
+    const bool isNegative = *digits >> (bits - 1) != 0;
+    return isNegative ? *digits - (std::int64_t{1} << bits) : *digits;
+}
+
+/// Reads the members of the object; each problem names the file.
+class MapReader {
+public:
+    MapReader(const Json& object, std::string name) : itsObject(object), itsName(std::move(name)) {}
+
+    NameMap read() const
+    {
+        NameMap map;
+        for (const auto& [key, value] : itsObject.items()) {
+            readMember(key, value, map);
+        }
+        return map;
+    }
+
+private:
+    [[noreturn]] void fail(const std::string& what) const
+    {
+        throw simulation::Error(itsName + ": " + what);
+    }
+
+    void readMember(const std::string& key, const Json& value, NameMap& map) const
+    {
+        if (key == "signals") {
+            readSignals(value, map);
+        } else if (key == "columns") {
+            readColumns(value, map);
+        } else if (key == "numbers") {
+            map.numbers = numberForm(value);
+        } else if (key == "bits") {
+            map.bits = count(key, value, 12, 32);
+        } else if (key == "first_half_iteration") {
+            map.firstPass = count(key, value, 0, 1);
+        } else if (key == "first_step") {
+            map.firstStep = count(key, value, 0, 1);
+        } else if (key == "valid") {
+            map.valid = text(key, value);
+        } else {
+            fail(shown(key) +
+                 " is no key of a map, allowed are columns, signals, numbers, bits, first_half_iteration, first_step, "
+                 "valid");
+        }
+    }
+
+    std::string text(const std::string& key, const Json& value) const
+    {
+        if (!value.is_string()) {
+            fail(shown(key) + " is no text");
+        }
+        return value.get<std::string>();
+    }
+
+    unsigned count(const std::string& key, const Json& value, unsigned first, unsigned last) const
+    {
+        if (!value.is_number_unsigned() || value.get<std::uint64_t>() < first || value.get<std::uint64_t>() > last) {
+            fail(shown(key) + " is " + value.dump() + ", allowed are the integers " + std::to_string(first) + " to " +
+                 std::to_string(last));
+        }
+        return value.get<unsigned>();
+    }
+
+    NumberForm numberForm(const Json& value) const
+    {
+        for (const auto& [form, kind] : numberForms) {
+            if (value == form) {
+                return kind;
+            }
+        }
+        fail("\"numbers\" is " + value.dump() + ", allowed are auto, integer, unsigned, real, hex, binary");
+    }
+
+    void readSignals(const Json& value, NameMap& map) const
+    {
+        if (!value.is_object()) {
+            fail("\"signals\" is no object");
+        }
+        for (const auto& [theirs, ours] : value.items()) {
+            const auto* const found = std::find_if(
+                signalNames.begin(), signalNames.end(), [&own = ours](const char* each) { return own == each; });
+            if (found == signalNames.end() && !ours.is_null()) {
+                fail("signal " + shown(theirs) + " is " + ours.dump() +
+                     ", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic, and null");
+            }
+            map.signals[theirs] =
+                ours.is_null() ? NameMap::leftOut : static_cast<unsigned>(found - signalNames.begin());
+        }
+    }
+
+    void readColumns(const Json& value, NameMap& map) const
+    {
+        if (!value.is_object()) {
+            fail("\"columns\" is no object");
+        }
+        for (const auto& [key, theirs] : value.items()) {
+            std::string* const column = key == "half_iteration" ? &map.passColumn
+                                        : key == "step"         ? &map.stepColumn
+                                        : key == "signal"       ? &map.signalColumn
+                                        : key == "value"        ? &map.valueColumn
+                                                                : nullptr;
+            if (column == nullptr) {
+                fail("column " + shown(key) + ", allowed are half_iteration, step, signal, value");
+            }
+            *column = text(key, theirs);
+        }
+    }
+
+    const Json& itsObject;
+    std::string itsName;
+};
+
+}  // namespace
+
+NameMap::NameMap()
+{
+    for (unsigned i = 0; i < signalCount; ++i) {
+        signals[signalNames[i]] = i;
+    }
+}
+
+std::optional<unsigned> NameMap::signal(std::string_view name) const
+{
+    const auto found = signals.find(name);
+    return found == signals.end() ? std::nullopt : std::optional<unsigned>(found->second);
+}
+
+std::optional<std::int64_t> NameMap::number(std::string_view text) const
+{
+    const bool isHexadecimal = text.substr(0, 2) == "0x" || text.substr(0, 2) == "0X";
+    if (!text.empty() && text[0] == '+') {
+        text.remove_prefix(1);  // which from_chars() does not take
+    }
+    switch (numbers) {
+    case NumberForm::integer:
+        return integer(text, 10);
+    case NumberForm::unsignedInteger:
+        return complement(integer(text, 10), bits);
+    case NumberForm::real:
+        return eighths(text);
+    case NumberForm::hexadecimal:
+        return complement(integer(isHexadecimal ? text.substr(2) : text, 16), bits);
+    case NumberForm::binary:
+        return complement(integer(text, 2), bits);
+    default:
+        break;
+    }
+    if (isHexadecimal) {
+        return complement(integer(text.substr(2), 16), bits);
+    }
+    return text.find('.') == std::string_view::npos ? integer(text, 10) : eighths(text);
+}
+
+std::string NameMap::expectedNumber() const
+{
+    const std::string width = std::to_string(bits);
+    switch (numbers) {
+    case NumberForm::unsignedInteger:
+        return "an unsigned integer of " + width + " bits";
+    case NumberForm::real:
+        return "a multiple of 1/8 from -256 to 255.875";
+    case NumberForm::hexadecimal:
+        return "a hexadecimal number of " + width + " bits";
+    case NumberForm::binary:
+        return "a binary number of " + width + " bits";
+    case NumberForm::integer:
+        return "an integer from -2048 to 2047";
+    default:
+        return "an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to 255.875";
+    }
+}
+
+NameMap readNameMap(std::istream& input, const std::string& name)
+{
+    std::ostringstream text;
+    text << input.rdbuf();
+    const Json object = Json::parse(text.str(), nullptr, false);
+    if (!object.is_object()) {
+        throw simulation::Error(name + ": no map, expected a JSON object");
+    }
+    return MapReader(object, name).read();
+}
+
+}  // namespace morvik::comparison

@@ -1,0 +1,295 @@
+// Patterns: what the faults of a dump have in common.
+#include "Patterns.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+
+#include "Replay.h"
+
+namespace morvik::comparison {
+
+namespace {
+
+/// The part of the faults that a pattern has to explain: a fault may hide behind another.
+constexpr double enough = 0.9;
+
+/// A mistake, and where it is named.
+struct NamedMistake {
+    Mistake mistake;
+    const char* text;
+};
+
+constexpr std::array<NamedMistake, 14> namedMistakes = {{
+    {Mistake::borderBitsKept, "the seven low bits of border metrics are not cleared (rule 11)"},
+    {Mistake::borderOfOtherPass,
+     "border metrics are those of the other pass: this one's for the last one's, or the reverse (rule 20)"},
+    {Mistake::borderUnknown, "border metrics are zeros, as for an unknown state (rule 10)"},
+    {Mistake::aprioriMissing, "a pass late: the extrinsic values of the pass before do not arrive (rule 13)"},
+    {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
+    {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
+    {Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"},
+    {Mistake::parityNegated, "the sign of the parity is flipped (rule 5)"},
+    {Mistake::unclipped, "saturation is missing: the sum is wider than eight bits (rules 5 and 14)"},
+    {Mistake::wrappedInEight, "saturation is missing: the sum is cut to its low eight bits (rules 5 and 14)"},
+    {Mistake::unwrapped, "the wrap is missing: values saturate (rule 2)"},
+    {Mistake::unscaled, "the factor of 0.75 is missing (rule 14)"},
+    {Mistake::uncorrected, "the correction table is missing (rule 7)"},
+    {Mistake::correctedAtOnce, "corrections come a decision early (rule 7)"},
+}};
+
+class Explainer {
+public:
+    Explainer(const Model& model, const Values& dump) : itsModel(model), itsDump(dump), itsReplay(model, dump) {}
+
+    /// Fills in how the faults came about.
+    void explain(const std::vector<Fault>& faults, Finding& finding) const
+    {
+        for (const NamedMistake& each : namedMistakes) {
+            consider(each.text, faults, finding, [this, &each](const Fault& fault) {
+                return fault.got == replayed(fault.place, fault.place.pass, each.mistake);
+            });
+        }
+        consider("a pass late: values are those of the last pass over the same code",
+                 faults,
+                 finding,
+                 [this](const Fault& fault) {
+                     return fault.place.pass >= 2
+                                ? fault.got == replayed(fault.place, fault.place.pass - 2, Mistake::none)
+                                : fault.got == 0;
+                 });
+        consider("the sign is flipped", faults, finding, [](const Fault& fault) {
+            return fault.got == std::min(-fault.wanted, +Values::largest);
+        });
+        consider("zeros", faults, finding, [](const Fault& fault) { return fault.got == 0; });
+        consider("one LSB too high: rounding", faults, finding, [](const Fault& fault) {
+            return fault.got == fault.wanted + 1;
+        });
+        consider("one LSB too low: rounding", faults, finding, [](const Fault& fault) {
+            return fault.got == fault.wanted - 1;
+        });
+        consider("off by one LSB: rounding", faults, finding, [](const Fault& fault) {
+            return std::abs(fault.got - fault.wanted) == 1;
+        });
+        for (const int step : {-1, 1}) {
+            consider(step < 0 ? "values of the step before" : "values of the step behind",
+                     faults,
+                     finding,
+                     [this, step](const Fault& fault) { return isOfOtherStep(fault, step); });
+        }
+        for (unsigned bit = 0; bit < 12; ++bit) {
+            consider("bit " + std::to_string(bit) + " is wrong", faults, finding, [bit](const Fault& fault) {
+                return ((fault.got ^ fault.wanted) & 0xFFF) == 1 << bit;
+            });
+        }
+    }
+
+private:
+    /// Keeps the pattern when it explains more than those before it.
+    template <class Matches>
+    static void consider(const std::string& text, const std::vector<Fault>& faults, Finding& finding, Matches matches)
+    {
+        const auto count = static_cast<std::size_t>(std::count_if(faults.begin(), faults.end(), matches));
+        if (count > finding.explained && static_cast<double>(count) >= enough * static_cast<double>(faults.size())) {
+            finding.how = text;
+            finding.explained = count;
+        }
+    }
+
+    int replayed(const Place& place, unsigned pass, Mistake mistake) const
+    {
+        const Stage stage = stageOf(place.signal);
+        return itsReplay.column(pass, stage, place.step, mistake).values[place.signal - signalsOf(stage).first];
+    }
+
+    bool isOfOtherStep(const Fault& fault, int step) const
+    {
+        const Place& place = fault.place;
+        const bool exists = step > 0 ? place.step + 1 < itsModel.division.K : place.step > 0;
+        return exists &&
+               fault.got == itsModel.values.at({place.pass, place.signal, step > 0 ? place.step + 1 : place.step - 1});
+    }
+
+    const Model& itsModel;
+    const Values& itsDump;
+    Replay itsReplay;
+};
+
+/// A kind of place in a block.
+struct Kind {
+    const char* text;
+    bool (*matches)(const Division&, const Place&);
+};
+
+bool startsSegment(const Division& division, const Place& place)
+{
+    return place.step < division.K && place.step % division.segmentLength == 0;
+}
+
+bool startsWindow(const Division& division, const Place& place)
+{
+    return place.step < division.K && division.windowAt(place.step).last == place.step;
+}
+
+constexpr bool isForward(const Place& place)
+{
+    return stageOf(place.signal) == Stage::forward;
+}
+
+constexpr bool isBackward(const Place& place)
+{
+    return stageOf(place.signal) == Stage::backward;
+}
+
+/// The narrow ones first.
+constexpr std::array<Kind, 8> kinds = {{
+    {"at the beginning of segment 0 alone",
+     [](const Division&, const Place& place) {
+         return isForward(place) && place.step == 0;
+     }},
+    {"at the tail alone: where the last window starts",
+     [](const Division& division, const Place& place) {
+         return isBackward(place) && place.step + 1 == division.K;
+     }},
+    {"in the tail alone",
+     [](const Division& division, const Place& place) {
+         return place.step >= division.K;
+     }},
+    {"at window edges alone: where segments start",
+     [](const Division& division, const Place& place) {
+         return isForward(place) && startsSegment(division, place);
+     }},
+    {"at window edges alone: where windows start",
+     [](const Division& division, const Place& place) {
+         return isBackward(place) && startsWindow(division, place);
+     }},
+    {"in segment 0 alone",
+     [](const Division& division, const Place& place) {
+         return division.segments > 1 && place.step < division.segmentLength;
+     }},
+    {"on the natural code alone",
+     [](const Division&, const Place& place) {
+         return codeOf(place.pass) == 0;
+     }},
+    {"on the interleaved code alone",
+     [](const Division&, const Place& place) {
+         return codeOf(place.pass) == 1;
+     }},
+}};
+
+/// What a property of all faults is, when it is one and the same.
+template <class Property>
+std::optional<unsigned> common(const std::vector<Fault>& faults, Property property)
+{
+    const unsigned first = property(faults.front().place);
+    const bool all =
+        std::all_of(faults.begin(), faults.end(), [&](const Fault& fault) { return property(fault.place) == first; });
+    return all ? std::optional<unsigned>(first) : std::nullopt;
+}
+
+void append(std::string& text, const std::string& part)
+{
+    text += (text.empty() ? "" : ", ") + part;
+}
+
+std::string whereOf(const Division& division, const std::vector<Fault>& faults)
+{
+    std::string text;
+    if (faults.size() == 1) {
+        return "at one place alone";
+    }
+    const auto* const kind = std::find_if(kinds.begin(), kinds.end(), [&](const Kind& each) {
+        return std::all_of(
+            faults.begin(), faults.end(), [&](const Fault& fault) { return each.matches(division, fault.place); });
+    });
+    if (kind != kinds.end()) {
+        append(text, kind->text);
+    }
+    if (const auto pass = common(faults, [](const Place& place) { return place.pass; })) {
+        append(text, "in half-iteration " + std::to_string(*pass) + " alone");
+    }
+    const auto signal = common(faults, [](const Place& place) { return place.signal; });
+    if (signal && signalsOf(stageOf(*signal)).count > 1) {
+        append(text, "in " + std::string(signalNames[*signal]) + " alone");
+    }
+    const auto segment = common(faults, [&](const Place& place) { return place.step / division.segmentLength; });
+    if (segment && *segment > 0 && *segment < division.segments) {
+        append(text, "in segment " + std::to_string(*segment) + " alone");
+    }
+    return text;
+}
+
+/// How many values of the dump are the model's, were its numbers other by these.
+struct Agreement {
+    std::uint64_t compared = 0;
+    std::uint64_t equal = 0;
+};
+
+Agreement agreement(const Model& model, const Values& dump, unsigned passes, unsigned steps)
+{
+    Agreement found;
+    for (unsigned pass = passes; pass < dump.passes(); ++pass) {
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            for (unsigned step = steps; step < dump.steps(); ++step) {
+                const Place theirs = {pass, signal, step};
+                const Place ours = {pass - passes, signal, step - steps};
+                if (dump.has(theirs) && model.values.has(ours)) {
+                    ++found.compared;
+                    found.equal += dump.at(theirs) == model.values.at(ours) ? 1U : 0U;
+                }
+            }
+        }
+    }
+    return found;
+}
+
+}  // namespace
+
+std::vector<Finding> findPatterns(const Model& model, const Values& dump, const std::vector<Fault>& faults)
+{
+    const Explainer explainer(model, dump);
+    std::vector<Finding> findings;
+    for (const Fault& each : faults) {
+        const Stage stage = stageOf(each.place.signal);
+        if (std::any_of(findings.begin(), findings.end(), [&](const Finding& known) { return known.stage == stage; })) {
+            continue;
+        }
+        std::vector<Fault> ofStage;
+        std::copy_if(faults.begin(), faults.end(), std::back_inserter(ofStage), [&](const Fault& fault) {
+            return stageOf(fault.place.signal) == stage;
+        });
+        Finding finding{};
+        finding.stage = stage;
+        finding.faults = ofStage.size();
+        finding.where = whereOf(model.division, ofStage);
+        explainer.explain(ofStage, finding);
+        findings.push_back(finding);
+    }
+    return findings;
+}
+
+std::optional<std::string> findShift(const Model& model, const Values& dump)
+{
+    constexpr std::uint64_t fewest = 32;
+    const auto agrees = [&](unsigned passes, unsigned steps) {
+        const Agreement found = agreement(model, dump, passes, steps);
+        return found.compared >= fewest &&
+               static_cast<double>(found.equal) >= enough * static_cast<double>(found.compared);
+    };
+    if (agrees(0, 0)) {
+        return std::nullopt;
+    }
+    if (agrees(1, 0)) {
+        return "the dump is a pass late, or counts half-iterations from 1; \"first_half_iteration\": 1 in a map says "
+               "so";
+    }
+    if (agrees(2, 0)) {
+        return "the dump is a pass late: its values are those of the last pass over the same code";
+    }
+    if (agrees(0, 1)) {
+        return "the dump is a step late, or counts steps from 1; \"first_step\": 1 in a map says so";
+    }
+    return std::nullopt;
+}
+
+}  // namespace morvik::comparison

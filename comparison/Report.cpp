@@ -1,0 +1,273 @@
+// Report: a comparison as text.
+#include "Report.h"
+
+#include <algorithm>
+#include <cstdarg>
+#include <cstdio>
+#include <vector>
+
+#include "Patterns.h"
+
+namespace morvik::comparison {
+
+namespace {
+
+constexpr unsigned contextSteps = 3;  // before and behind the first difference
+
+__attribute__((format(printf, 1, 2))) std::string format(const char* form, ...)
+{
+    char buffer[256];
+    va_list arguments;
+    va_start(arguments, form);
+    std::vsnprintf(buffer, sizeof buffer, form, arguments);
+    va_end(arguments);
+    return buffer;
+}
+
+std::string counted(std::uint64_t count, const std::string& noun)
+{
+    return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
+}
+
+const char* codeName(unsigned pass)
+{
+    return codeOf(pass) == 0 ? "natural" : "interleaved";
+}
+
+/// What the values of a stage are, and the operation that gives them.
+struct StageWords {
+    const char* values;
+    const char* operation;
+};
+
+StageWords wordsOf(Stage stage)
+{
+    switch (stage) {
+    case Stage::intrinsic:
+        return {"intrinsic values",
+                "the intrinsic value: half the extrinsic value, the systematic value added (rule 13)"};
+    case Stage::branch:
+        return {"branch metrics", "the branch metrics: sums of intrinsic and parity values, clipped (rule 5)"};
+    case Stage::forward:
+        return {"forward metrics", "the forward recursion (rules 6 and 7)"};
+    case Stage::backward:
+        return {"backward metrics", "the backward recursion (rules 6 and 7)"};
+    case Stage::ratio:
+        return {"log-likelihood ratios", "the log-likelihood ratio (rule 8)"};
+    default:
+        return {"extrinsic values", "the extrinsic value: ratio - 4 x intrinsic value, scaled and clipped (rule 14)"};
+    }
+}
+
+const char* shortName(Stage stage)
+{
+    constexpr std::array<const char*, 6> names = {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"};
+    return names[static_cast<std::size_t>(stage)];
+}
+
+class Reporter {
+public:
+    Reporter(const Comparison& comparison, const Model& model, const Dump& dump, const std::string& name)
+        : itsComparison(comparison), itsModel(model), itsDump(dump), itsName(name)
+    {
+    }
+
+    std::string text()
+    {
+        itsText = itsName + ": " + counted(itsComparison.compared(), "value") + " compared, ";
+        if (!itsComparison.first) {
+            return itsText + "all as the model computes them\n";
+        }
+        itsText += counted(itsComparison.different(), "difference") + "\n\n";
+        addPlace(*itsComparison.first);
+        addValue(*itsComparison.first);
+        addContext(*itsComparison.first);
+        addInputs(*itsComparison.first);
+        addCounts();
+        addFindings();
+        return itsText;
+    }
+
+private:
+    void addPlace(const Place& place)
+    {
+        const Division& division = itsModel.division;
+        itsText += "First difference, in the order of computation (" + itsName + ':' +
+                   std::to_string(itsDump.lineOf(place)) + "):\n";
+        itsText += format("  half-iteration  %u, on the %s code\n", place.pass, codeName(place.pass));
+        const unsigned step = std::min(place.step, division.K - 1);
+        const unsigned segment = step / division.segmentLength;
+        const Window& window = division.windowAt(step);
+        itsText += format("  unit            %u of %u\n", division.unitOf(segment), division.numPu);
+        itsText += format("  segment         %u of %u, steps %u to %u\n",
+                          segment,
+                          division.segments,
+                          segment * division.segmentLength,
+                          (segment + 1) * division.segmentLength - 1);
+        itsText += format(
+            "  window          %u of %u, steps %u to %u\n", window.row, division.rows, window.first, window.last);
+        itsText += format("  trellis step    %u, %s\n", place.step, bitText(place).c_str());
+        itsText += format("  signal          %s\n\n", signalNames[place.signal]);
+    }
+
+    std::string bitText(const Place& place) const
+    {
+        if (place.step >= itsModel.division.K) {
+            return "behind the bits";
+        }
+        const unsigned bit = codeOf(place.pass) == 0 ? place.step : itsModel.codes[1].order[place.step];
+        return "bit " + std::to_string(bit) + " of the block";
+    }
+
+    static std::string valueLine(const char* name, int value)
+    {
+        return format(
+            "  %-12s%9d%12.3f%7s0x%03x\n", name, value, value / 8.0, "", static_cast<unsigned>(value) & 0xFFFU);
+    }
+
+    void addValue(const Place& place)
+    {
+        itsText += "                decimal        real         hex\n";
+        itsText += valueLine("expected", itsModel.values.at(place));
+        itsText += valueLine("got", itsDump.values.at(place)) + '\n';
+    }
+
+    void addContext(const Place& place)
+    {
+        const unsigned first = place.step - std::min(place.step, contextSteps);
+        const unsigned last = std::min(place.step + contextSteps, itsDump.values.steps() - 1);
+        itsText += format("  %8s%12s%12s\n", "step", "expected", "got");
+        for (unsigned step = first; step <= last; ++step) {
+            const Place each = {place.pass, place.signal, step};
+            if (!itsModel.values.has(each)) {
+                continue;
+            }
+            const bool has = itsDump.values.has(each);
+            const std::string got = has ? std::to_string(itsDump.values.at(each)) : "-";
+            const bool differs = has && itsDump.values.at(each) != itsModel.values.at(each);
+            itsText += format("%s %9u%12d%12s%s\n",
+                              step == place.step ? ">" : " ",
+                              step,
+                              itsModel.values.at(each),
+                              got.c_str(),
+                              differs ? " *" : "");
+        }
+        itsText += '\n';
+    }
+
+    void addInputs(const Place& place)
+    {
+        bool differ = false;
+        bool known = true;
+        for (const InputState& input : itsComparison.inputs) {
+            const char* const state = input.present == 0     ? "not in the dump"
+                                      : input.different == 0 ? "agrees"
+                                                             : "differs";
+            const unsigned all = signalsOf(input.stage).count;
+            const std::string part = input.present > 0 && input.present < all ? ", as far as it is in the dump" : "";
+            itsText += format("  input %-10s of half-iteration %u, step %u: %s%s\n",
+                              shortName(input.stage),
+                              input.pass,
+                              input.step,
+                              state,
+                              part.c_str());
+            differ = differ || input.different > 0;
+            known = known && input.present == all;
+        }
+        addVerdict(place, differ, known);
+    }
+
+    void addVerdict(const Place& place, bool differ, bool known)
+    {
+        const std::string operation = startText(place);
+        if (differ) {
+            itsText += "An input differs, too, so the value may follow from it.\n\n";
+        } else if (itsComparison.inputs.empty()) {
+            itsText += "It comes from nothing that is computed before. At fault: " + operation + ".\n\n";
+        } else if (known) {
+            itsText += "All its inputs agree. At fault: " + operation + ".\n\n";
+        } else {
+            itsText += "At fault: " + operation + ", or what stands before it and is not in the dump.\n\n";
+        }
+    }
+
+    /// The operation that gives a value, a start column among them.
+    std::string startText(const Place& place) const
+    {
+        const Division& division = itsModel.division;
+        const Stage stage = stageOf(place.signal);
+        if (stage == Stage::forward && place.step % division.segmentLength == 0 && place.step < division.K) {
+            return place.step == 0  ? "the known state at the beginning (rule 10)"
+                   : place.pass < 2 ? "the unknown state at the start of the segment (rules 10 and 19)"
+                                    : "the border metrics at the start of the segment (rules 11 and 19), or the step "
+                                      "that leads to them";
+        }
+        if (stage == Stage::backward && division.windowAt(place.step).last == place.step) {
+            return division.isFinal(division.windowAt(place.step)) ? "the metrics of the tail (rule 12)"
+                   : place.pass < 2 ? "the unknown state at the start of the window (rules 10 and 20)"
+                                    : "the border metrics at the start of the window (rules 11 and 20), or the step "
+                                      "that leads to them";
+        }
+        return wordsOf(stage).operation;
+    }
+
+    void addCounts()
+    {
+        itsText +=
+            format("%-10s%10s%12s%10s   %s\n", "signal", "compared", "differences", "faults", "first difference");
+        for (unsigned i = 0; i < signalCount; ++i) {
+            const SignalCount& count = itsComparison.signals[i];
+            if (count.compared == 0) {
+                continue;
+            }
+            itsText += format("%-10s%10llu%12llu%10llu",
+                              signalNames[i],
+                              static_cast<unsigned long long>(count.compared),
+                              static_cast<unsigned long long>(count.different),
+                              static_cast<unsigned long long>(count.faults));
+            itsText +=
+                count.first ? format("   half-iteration %u, step %u\n", count.first->pass, count.first->step) : "\n";
+        }
+        itsText +=
+            itsComparison.inputsAreKnown
+                ? "Faults do not follow from the dump's own inputs of them; other differences are consequences.\n\n"
+                : "Faults cannot be told from consequences: the dump lacks the inputs.\n\n";
+    }
+
+    void addFindings()
+    {
+        if (const auto shift = findShift(itsModel, itsDump.values)) {
+            itsText += "Found: " + *shift + ".\n";
+            return;
+        }
+        for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison.faults)) {
+            const std::string values = wordsOf(finding.stage).values;
+            itsText += "Found in " + values + ", " + counted(finding.faults, "fault");
+            itsText += finding.where.empty() ? "" : ", " + finding.where;
+            itsText += ":\n  ";
+            if (finding.how.empty()) {
+                itsText += "no pattern that is known";
+            } else if (finding.explained == finding.faults) {
+                itsText += finding.how;
+            } else {
+                itsText += finding.how + ", in " + std::to_string(finding.explained) + " of them";
+            }
+            itsText += ".\n";
+        }
+    }
+
+    const Comparison& itsComparison;
+    const Model& itsModel;
+    const Dump& itsDump;
+    const std::string& itsName;
+    std::string itsText;
+};
+
+}  // namespace
+
+std::string textOf(const Comparison& comparison, const Model& model, const Dump& dump, const std::string& name)
+{
+    return Reporter(comparison, model, dump, name).text();
+}
+
+}  // namespace morvik::comparison

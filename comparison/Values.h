@@ -1,0 +1,106 @@
+// Values: the values of all signals in all passes over a block.
+#ifndef MORVIK_COMPARISON_VALUES_H
+#define MORVIK_COMPARISON_VALUES_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+namespace morvik::comparison {
+
+/// The operations of a pass, in their order.
+enum class Stage : std::uint8_t { intrinsic, branch, forward, backward, ratio, extrinsic };
+
+constexpr std::array<Stage, 6> stages = {
+    Stage::intrinsic, Stage::branch, Stage::forward, Stage::backward, Stage::ratio, Stage::extrinsic};
+
+/// The signals, stage by stage.
+constexpr std::array<const char*, 23> signalNames = {"intrinsic", "g0",     "g1",     "g2",     "g3",       "alpha0",
+                                                     "alpha1",    "alpha2", "alpha3", "alpha4", "alpha5",   "alpha6",
+                                                     "alpha7",    "beta0",  "beta1",  "beta2",  "beta3",    "beta4",
+                                                     "beta5",     "beta6",  "beta7",  "llr",    "extrinsic"};
+
+constexpr unsigned signalCount = signalNames.size();
+
+/// The signals of a stage.
+struct SignalRange {
+    unsigned first;
+    unsigned count;
+};
+
+constexpr SignalRange signalsOf(Stage stage)
+{
+    constexpr std::array<SignalRange, 6> ranges = {{{0, 1}, {1, 4}, {5, 8}, {13, 8}, {21, 1}, {22, 1}}};
+    return ranges[static_cast<std::size_t>(stage)];
+}
+
+constexpr Stage stageOf(unsigned signal)
+{
+    Stage found = Stage::intrinsic;
+    for (const Stage stage : stages) {
+        if (signalsOf(stage).first <= signal) {
+            found = stage;
+        }
+    }
+    return found;
+}
+
+/// A value of a block: half-iteration, signal, trellis step.
+struct Place {
+    unsigned pass;
+    unsigned signal;
+    unsigned step;
+};
+
+/// Values in steps of the state metrics' format: 12 bits, eighths of 1.
+class Values {
+public:
+    static constexpr std::int16_t smallest = -2048;
+    static constexpr std::int16_t largest = 2047;
+    static constexpr std::int16_t missing = INT16_MIN;
+
+    Values(unsigned passes, unsigned steps)
+        : itsPasses(passes), itsSteps(steps), itsValues(std::size_t{passes} * signalCount * steps, missing)
+    {
+    }
+
+    unsigned passes() const
+    {
+        return itsPasses;
+    }
+
+    unsigned steps() const
+    {
+        return itsSteps;
+    }
+
+    std::size_t index(const Place& place) const
+    {
+        return (std::size_t{place.pass} * signalCount + place.signal) * itsSteps + place.step;
+    }
+
+    std::int16_t at(const Place& place) const
+    {
+        return itsValues[index(place)];
+    }
+
+    bool has(const Place& place) const
+    {
+        return at(place) != missing;
+    }
+
+    void set(const Place& place, std::int16_t value)
+    {
+        itsValues[index(place)] = value;
+    }
+
+private:
+    unsigned itsPasses;
+    unsigned itsSteps;
+    std::vector<std::int16_t> itsValues;
+};
+
+}  // namespace morvik::comparison
+
+#endif

@@ -1,0 +1,335 @@
+// VcdDump: dumps as value change dumps (IEEE 1364, clause 18).
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <cstddef>
+#include <map>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Dump.h"
+#include "DumpFile.h"
+#include "simulation/Shown.h"
+
+namespace morvik::comparison {
+
+namespace {
+
+using simulation::shown;
+
+/// What a scope's values belong to, and whether they count.
+enum class Role : std::uint8_t { pass, step, valid, signal };
+
+constexpr unsigned nobody = ~0U;
+
+/// The variables of a scope that count. Those of a scope around it stand for what it lacks itself.
+struct Scope {
+    unsigned parent = nobody;
+    unsigned pass = nobody;  // variables
+    unsigned step = nobody;
+    unsigned valid = nobody;
+    std::vector<unsigned> signals;  // variables
+    bool changed = false;
+};
+
+struct Variable {
+    std::string name;
+    unsigned scope = 0;
+    Role role = Role::signal;
+    unsigned signal = 0;
+    unsigned bits = 0;
+    bool isReal = false;
+    std::optional<std::int64_t> value;  ///< none while unknown
+    std::uint32_t line = 0;             ///< where it has changed
+};
+
+class VcdReader {
+public:
+    VcdReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
+        : itsFile(input, name), itsMap(map), itsDump(dump)
+    {
+    }
+
+    void read()
+    {
+        while (nextWord()) {
+            if (itsWord[0] == '$') {
+                readCommand();
+            } else if (itsWord[0] == '#') {
+                keepChanges();
+            } else {
+                readChange();
+            }
+        }
+        keepChanges();
+        if (!itsAnySignal) {
+            itsFile.fail("no variable of the dump is a signal that is known; a map tells which is which");
+        }
+    }
+
+private:
+    bool nextWord()
+    {
+        while (true) {
+            itsRest.remove_prefix(std::min(itsRest.find_first_not_of(" \t"), itsRest.size()));
+            if (!itsRest.empty()) {
+                itsWord = itsRest.substr(0, itsRest.find_first_of(" \t"));
+                itsRest.remove_prefix(itsWord.size());
+                return true;
+            }
+            if (!itsFile.next()) {
+                return false;
+            }
+            itsRest = itsFile.line();
+        }
+    }
+
+    std::string expectWord(const char* what)
+    {
+        if (!nextWord() || itsWord == "$end") {
+            itsFile.fail(std::string("the dump ends where ") + what + " is expected");
+        }
+        return std::string(itsWord);
+    }
+
+    void skipToEnd()
+    {
+        while (itsWord != "$end") {
+            if (!nextWord()) {
+                itsFile.fail("a command without $end");
+            }
+        }
+    }
+
+    void readCommand()
+    {
+        const std::string command(itsWord);
+        if (command == "$dumpvars" || command == "$dumpall" || command == "$dumpon" || command == "$end") {
+            return;  // the changes in it are read as others are
+        }
+        if (command == "$scope") {
+            expectWord("the kind of a scope");
+            expectWord("the name of a scope");
+            Scope scope;
+            scope.parent = itsScope;
+            itsScope = static_cast<unsigned>(itsScopes.size());
+            itsScopes.push_back(scope);
+        } else if (command == "$upscope") {
+            if (itsScope == nobody) {
+                itsFile.fail("$upscope outside of all scopes");
+            }
+            itsScope = itsScopes[itsScope].parent;
+        } else if (command == "$var") {
+            readVariable();
+        } else if (command == "$dumpoff") {
+            forgetAll();
+        }
+        nextWord();
+        skipToEnd();
+    }
+
+    void forgetAll()
+    {
+        for (Variable& variable : itsVariables) {
+            variable.value.reset();
+        }
+    }
+
+    void readVariable()
+    {
+        Variable variable;
+        variable.isReal = expectWord("the kind of a variable") == "real";
+        const std::string width = expectWord("the width of a variable");
+        variable.bits = itsFile.count("width", width, 1, 65536) + 1;
+        const std::string identifier = expectWord("the identifier of a variable");
+        variable.name = expectWord("the name of a variable");
+        if (itsScope == nobody) {
+            itsFile.fail("variable " + shown(variable.name) + " outside of all scopes");
+        }
+        variable.scope = itsScope;
+        variable.name = variable.name.substr(0, variable.name.find('['));
+        if (takesPart(variable)) {
+            itsByIdentifier[identifier].push_back(static_cast<unsigned>(itsVariables.size()));
+            itsVariables.push_back(variable);
+        } else {
+            itsByIdentifier[identifier];  // so that its changes are known to be of a variable
+        }
+    }
+
+    /// Finds out what the variable is for; false when it does not count.
+    bool takesPart(Variable& variable)
+    {
+        Scope& scope = itsScopes[variable.scope];
+        const auto number = static_cast<unsigned>(itsVariables.size());
+        const auto signal = itsMap.signal(variable.name);
+        if (variable.name == itsMap.passColumn) {
+            variable.role = Role::pass;
+            scope.pass = number;
+        } else if (variable.name == itsMap.stepColumn) {
+            variable.role = Role::step;
+            scope.step = number;
+        } else if (!itsMap.valid.empty() && variable.name == itsMap.valid) {
+            variable.role = Role::valid;
+            scope.valid = number;
+        } else if (signal && *signal != NameMap::leftOut) {
+            variable.signal = *signal;
+            scope.signals.push_back(number);
+            itsAnySignal = true;
+        } else {
+            return false;
+        }
+        return true;
+    }
+
+    void readChange()
+    {
+        std::string digits(itsWord);
+        std::string identifier;
+        const char kind = digits[0];
+        if (kind == 'b' || kind == 'B' || kind == 'r' || kind == 'R') {
+            digits.erase(0, 1);
+            identifier = expectWord("the identifier of a variable");
+        } else if (kind == '0' || kind == '1' || kind == 'x' || kind == 'X' || kind == 'z' || kind == 'Z') {
+            identifier = digits.substr(1);
+            digits.resize(1);
+        } else if (kind == 's' || kind == 'S') {
+            expectWord("the identifier of a variable");
+            return;  // a text
+        } else {
+            itsFile.fail(shown(itsWord) + " is no change of a value");
+        }
+        const auto found = itsByIdentifier.find(identifier);
+        if (found == itsByIdentifier.end()) {
+            itsFile.fail("no variable has the identifier " + shown(identifier));
+        }
+        for (const unsigned number : found->second) {
+            change(itsVariables[number], digits);
+        }
+    }
+
+    void change(Variable& variable, const std::string& digits)
+    {
+        variable.value = variable.isReal ? realValue(variable, digits) : bitsValue(variable, digits);
+        variable.line = itsFile.number();
+        itsScopes[variable.scope].changed = true;
+        // What a scope says of its place holds for those in it, too, and they come behind it.
+        for (std::size_t i = variable.scope; variable.role != Role::signal && i < itsScopes.size(); ++i) {
+            itsScopes[i].changed = itsScopes[i].changed || isInside(i, variable.scope);
+        }
+    }
+
+    bool isInside(std::size_t scope, unsigned outer) const
+    {
+        while (scope != nobody && scope != outer) {
+            scope = itsScopes[scope].parent;
+        }
+        return scope == outer;
+    }
+
+    std::int64_t realValue(const Variable& variable, const std::string& digits) const
+    {
+        NameMap reals;
+        reals.numbers = NumberForm::real;
+        const bool inEighths = variable.role == Role::signal;
+        const auto value = reals.number(digits);
+        if (!value || (!inEighths && *value % 8 != 0)) {
+            itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected " +
+                         (inEighths ? reals.expectedNumber() : "an integer"));
+        }
+        return inEighths ? *value : *value / 8;
+    }
+
+    /// Leading digits that a dump leaves out are 0 (or, behind x and z, unknown as well).
+    std::optional<std::int64_t> bitsValue(const Variable& variable, const std::string& digits) const
+    {
+        std::int64_t value = 0;
+        for (const char digit : digits) {
+            if (digit != '0' && digit != '1') {
+                if (std::string("xXzZ").find(digit) == std::string::npos) {
+                    itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected binary digits");
+                }
+                return std::nullopt;
+            }
+            value = 2 * value + (digit - '0');
+            if (value >> 32 != 0) {
+                itsFile.fail(variable.name + " has more than 32 bits");
+            }
+        }
+        const bool isNegative = variable.role == Role::signal && digits.size() >= variable.bits && digits[0] == '1';
+        return isNegative ? value - (std::int64_t{1} << digits.size()) : value;
+    }
+
+    /// The variable of a scope, or of the closest scope around it that has one.
+    template <class Member>
+    const Variable* find(unsigned scope, Member member) const
+    {
+        for (; scope != nobody; scope = itsScopes[scope].parent) {
+            if (itsScopes[scope].*member != nobody) {
+                return &itsVariables[itsScopes[scope].*member];
+            }
+        }
+        return nullptr;
+    }
+
+    void keepChanges()
+    {
+        for (std::size_t i = 0; i < itsScopes.size(); ++i) {
+            if (itsScopes[i].changed && !itsScopes[i].signals.empty()) {
+                keep(static_cast<unsigned>(i));
+            }
+            itsScopes[i].changed = false;
+        }
+    }
+
+    void keep(unsigned scope)
+    {
+        const Variable* const pass = find(scope, &Scope::pass);
+        const Variable* const step = find(scope, &Scope::step);
+        const Variable* const valid = find(scope, &Scope::valid);
+        if (pass == nullptr || step == nullptr) {
+            itsFile.fail("no variable " + shown(pass == nullptr ? itsMap.passColumn : itsMap.stepColumn) +
+                         " in the scope of " + shown(itsVariables[itsScopes[scope].signals.front()].name) +
+                         " or around it");
+        }
+        if (!pass->value || !step->value || (valid != nullptr && valid->value.value_or(0) != 1)) {
+            return;
+        }
+        const unsigned h =
+            itsFile.count("half-iteration", std::to_string(*pass->value), itsMap.firstPass, itsDump.values.passes());
+        const unsigned n =
+            itsFile.count("step", std::to_string(*step->value), itsMap.firstStep, itsDump.values.steps());
+        for (const unsigned number : itsScopes[scope].signals) {
+            const Variable& variable = itsVariables[number];
+            if (!variable.value) {
+                continue;
+            }
+            if (*variable.value < Values::smallest || *variable.value > Values::largest) {
+                itsFile.fail(variable.name + ' ' + std::to_string(*variable.value) +
+                             " is not allowed, expected -2048 to 2047 eighths");
+            }
+            itsDump.values.set({h, variable.signal, n}, static_cast<std::int16_t>(*variable.value));
+            itsDump.lineOf({h, variable.signal, n}) = variable.line;
+        }
+    }
+
+    DumpFile itsFile;
+    const NameMap& itsMap;
+    Dump& itsDump;
+    std::string_view itsRest;
+    std::string_view itsWord;
+    std::vector<Scope> itsScopes;
+    unsigned itsScope = nobody;
+    std::vector<Variable> itsVariables;
+    std::map<std::string, std::vector<unsigned>, std::less<>> itsByIdentifier;
+    bool itsAnySignal = false;
+};
+
+}  // namespace
+
+void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
+{
+    VcdReader(input, name, map, dump).read();
+}
+
+}  // namespace morvik::comparison

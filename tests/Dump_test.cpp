@@ -1,0 +1,233 @@
+// Dumps: CSV and VCD read, maps, and what is said of files that are none.
+#include "comparison/Dump.h"
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+#include <string>
+
+#include "simulation/Error.h"
+
+namespace {
+
+using namespace morvik::comparison;
+
+NameMap mapOf(const std::string& json)
+{
+    std::istringstream input(json);
+    return readNameMap(input, "map.json");
+}
+
+using Reader = void (*)(std::istream&, const std::string&, const NameMap&, Dump&);
+
+/// Two passes of 43 steps.
+Dump read(Reader reader, const std::string& text, const NameMap& map = {})
+{
+    std::istringstream input(text);
+    Dump dump(2, 43);
+    reader(input, "dump", map, dump);
+    return dump;
+}
+
+void expectRefused(Reader reader, const std::string& text, const std::string& message, const NameMap& map = {})
+{
+    try {
+        read(reader, text, map);
+        FAIL() << "accepted";
+    } catch (const simulation::Error& error) {
+        EXPECT_EQ(error.what(), message);
+    }
+}
+
+void expectMapRefused(const std::string& json, const std::string& message)
+{
+    try {
+        mapOf(json);
+        FAIL() << "accepted";
+    } catch (const simulation::Error& error) {
+        EXPECT_EQ(error.what(), message);
+    }
+}
+
+const std::string header = "half_iteration,step,signal,value\n";
+constexpr unsigned alpha3 = 8;
+constexpr unsigned llr = 21;
+
+TEST(CsvDump, ReadsValuesInAnyOrderOfRowsAndColumns)
+{
+    const Dump dump =
+        read(readCsv, "window,value,signal,step,half_iteration\r\n0,-5,llr,7,1\r\n\r\n0,2047,alpha3,0,0\r\n");
+    EXPECT_EQ(dump.values.at({1, llr, 7}), -5);
+    EXPECT_EQ(dump.lineOf({1, llr, 7}), 2U);
+    EXPECT_EQ(dump.values.at({0, alpha3, 0}), 2047);
+    EXPECT_EQ(dump.lineOf({0, alpha3, 0}), 4U);
+    EXPECT_FALSE(dump.values.has({0, llr, 7}));
+}
+
+TEST(CsvDump, ReadsAColumnForEachSignal)
+{
+    const Dump dump = read(readCsv, "block,half_iteration,step,unit,alpha3,llr\n0,1,7,0,-5,x\n0,0,0,0,,6\n");
+    EXPECT_EQ(dump.values.at({1, alpha3, 7}), -5);
+    EXPECT_FALSE(dump.values.has({1, llr, 7}));
+    EXPECT_FALSE(dump.values.has({0, alpha3, 0}));
+    EXPECT_EQ(dump.values.at({0, llr, 0}), 6);
+}
+
+TEST(CsvDump, ReadsEachFormOfNumbers)
+{
+    const auto value = [](const std::string& form, const std::string& text) {
+        return read(readCsv, header + "0,0,llr," + text + '\n', mapOf("{" + form + "}")).values.at({0, llr, 0});
+    };
+    EXPECT_EQ(value("", "-12"), -12);
+    EXPECT_EQ(value("", "+12"), 12);
+    EXPECT_EQ(value("", "-12.375"), -99);
+    EXPECT_EQ(value("", "-12.375000"), -99);
+    EXPECT_EQ(value("", "0xfff"), -1);
+    EXPECT_EQ(value(R"("numbers": "integer")", "-12"), -12);
+    EXPECT_EQ(value(R"("numbers": "unsigned")", "4095"), -1);
+    EXPECT_EQ(value(R"("numbers": "real")", "-12"), -96);
+    EXPECT_EQ(value(R"("numbers": "hex")", "800"), -2048);
+    EXPECT_EQ(value(R"("numbers": "hex", "bits": 16)", "ffff"), -1);
+    EXPECT_EQ(value(R"("numbers": "binary")", "100000000000"), -2048);
+}
+
+TEST(CsvDump, TakesTheNamesOfAMap)
+{
+    const NameMap map = mapOf(R"({"columns": {"half_iteration": "pass", "step": "k", "signal": "net", "value": "v"},
+        "signals": {"u.am3": "alpha3", "clk": null}, "first_half_iteration": 1, "first_step": 1})");
+    const Dump dump = read(readCsv, "pass,k,net,v\n2,8,u.am3,5\n0,0,clk,1\n", map);
+    EXPECT_EQ(dump.values.at({1, alpha3, 7}), 5);
+}
+
+TEST(CsvDump, NamesThePlaceOfAMistake)
+{
+    const std::string numbers =
+        " is not allowed, expected an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to "
+        "255.875";
+    expectRefused(readCsv, "", "dump:1: no header, expected the columns half_iteration, step, signal, value");
+    expectRefused(readCsv, "a,b\n", R"(dump:1: no column "half_iteration" in the header "a,b")");
+    expectRefused(readCsv, header + "0,0,llr\n", "dump:2: 3 fields, expected the 4 of the header");
+    expectRefused(readCsv,
+                  header + "0,0,LLR,1\n",
+                  R"(dump:2: signal "LLR" is not known; a map tells which it is, or that it does not count)");
+    expectRefused(readCsv,
+                  header + "2,0,llr,1\n",
+                  R"(dump:2: half-iteration "2" is not allowed, allowed are the integers 0 to 1)");
+    expectRefused(
+        readCsv, header + "0,43,llr,1\n", R"(dump:2: step "43" is not allowed, allowed are the integers 0 to 42)");
+    expectRefused(readCsv, header + "0,0,llr,2048\n", R"(dump:2: llr "2048")" + numbers);
+    expectRefused(readCsv, header + "0,0,llr,0.1\n", R"(dump:2: llr "0.1")" + numbers);
+    expectRefused(readCsv, header + "0,0,llr,q\n", R"(dump:2: llr "q")" + numbers);
+    expectRefused(readCsv,
+                  header + "0,0,llr,1\n0,0,llr,1\n",
+                  "dump:3: llr of this half-iteration and step stands in line 2, too");
+    expectRefused(readCsv,
+                  header + "0,0,llr,1000\n",
+                  R"(dump:2: llr "1000" is not allowed, expected a hexadecimal number of 12 bits)",
+                  mapOf(R"({"numbers": "hex"})"));
+}
+
+TEST(NameMap, NamesWhatIsWrong)
+{
+    expectMapRefused("[]", "map.json: no map, expected a JSON object");
+    expectMapRefused("{", "map.json: no map, expected a JSON object");
+    expectMapRefused(R"({"signal": {}})",
+                     "map.json: \"signal\" is no key of a map, allowed are columns, signals, numbers, bits, "
+                     "first_half_iteration, first_step, valid");
+    expectMapRefused(
+        R"({"signals": {"a": "alpha8"}})",
+        "map.json: signal \"a\" is \"alpha8\", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to "
+        "beta7, llr, extrinsic, and null");
+    expectMapRefused(R"({"signals": 1})", "map.json: \"signals\" is no object");
+    expectMapRefused(R"({"columns": {"row": "x"}})",
+                     "map.json: column \"row\", allowed are half_iteration, step, signal, value");
+    expectMapRefused(R"({"columns": {"step": 1}})", "map.json: \"step\" is no text");
+    expectMapRefused(R"({"numbers": "octal"})",
+                     "map.json: \"numbers\" is \"octal\", allowed are auto, integer, unsigned, real, hex, binary");
+    expectMapRefused(R"({"bits": 64})", "map.json: \"bits\" is 64, allowed are the integers 12 to 32");
+}
+
+/// Two units, of which the second is idle at first; the counters are those of the core.
+const std::string vcd = R"($date today $end
+$timescale 1 ns $end
+$scope module core $end
+$var integer 32 h half_iteration $end
+$scope module unit0 $end
+$var wire 13 s step [12:0] $end
+$var wire 12 l llr [11:0] $end
+$var real 64 r extrinsic $end
+$var wire 1 c clk $end
+$upscope $end
+$scope module unit1 $end
+$var wire 13 t step [12:0] $end
+$var wire 12 m llr [11:0] $end
+$upscope $end
+$upscope $end
+$enddefinitions $end
+#0
+$dumpvars
+b0 h
+b0 s
+b111111110100 l
+r-0.5 r
+0c
+bx t
+bx m
+$end
+#5
+1c
+b1 s
+b101 l
+#10
+b1 h
+b10 s
+b101000 t
+b1 m
+)";
+
+TEST(VcdDump, ReadsTheValuesOfEachScope)
+{
+    constexpr unsigned extrinsic = 22;
+    const Dump dump = read(readVcd, vcd);
+    EXPECT_EQ(dump.values.at({0, llr, 0}), -12);
+    EXPECT_EQ(dump.values.at({0, extrinsic, 0}), -4);
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 5);
+    EXPECT_EQ(dump.values.at({1, llr, 2}), 5);
+    EXPECT_EQ(dump.values.at({1, llr, 40}), 1);
+    EXPECT_FALSE(dump.values.has({0, llr, 40}));
+    EXPECT_FALSE(dump.values.has({1, llr, 0}));
+    EXPECT_EQ(dump.lineOf({0, llr, 0}), 21U);
+}
+
+TEST(VcdDump, CountsOnlyWhatIsValid)
+{
+    const Dump dump = read(readVcd, vcd, mapOf(R"({"valid": "clk"})"));
+    EXPECT_FALSE(dump.values.has({0, llr, 0}));
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 5);
+}
+
+TEST(VcdDump, NamesThePlaceOfAMistake)
+{
+    const std::string start = "$scope module core $end\n$var wire 13 s step $end\n";
+    const std::string pass = "$var wire 5 h half_iteration $end\n";
+    const std::string ratio = "$var wire 16 l llr $end\n";
+    const std::string end = "$upscope $end\n$enddefinitions $end\n";
+    expectRefused(readVcd,
+                  start + pass + end,
+                  "dump:5: no variable of the dump is a signal that is known; a map tells which is which");
+    expectRefused(readVcd,
+                  start + ratio + end + "#0\nb1 s\nb1 l\n",
+                  R"(dump:9: no variable "half_iteration" in the scope of "llr" or around it)");
+    expectRefused(readVcd, start + pass + ratio + end + "#0\nb1 q\n", R"(dump:8: no variable has the identifier "q")");
+    expectRefused(readVcd, start + pass + ratio + end + "hello\n", R"(dump:7: "hello" is no change of a value)");
+    expectRefused(readVcd, start + "$comment", "dump:3: a command without $end");
+    expectRefused(readVcd, "$upscope $end\n", "dump:1: $upscope outside of all scopes");
+    expectRefused(readVcd,
+                  start + pass + ratio + end + "#0\nb0 h\nb1111111 s\nb1 l\n",
+                  R"(dump:10: step "127" is not allowed, allowed are the integers 0 to 42)");
+    expectRefused(readVcd,
+                  start + pass + ratio + end + "#0\nb0 h\nb1 s\nb0111111111111111 l\n",
+                  "dump:10: llr 32767 is not allowed, expected -2048 to 2047 eighths");
+}
+
+}  // namespace

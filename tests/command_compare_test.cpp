@@ -1,0 +1,172 @@
+// The command morvik compare: dumps of cores with a fault, and of the core itself.
+#include <cstdlib>
+#include <ostream>
+
+#include "support/Blocks.h"
+#include "support/CommandTest.h"
+
+namespace {
+
+using namespace support;
+
+/// A core with a fault, and what the command has to say of its dump.
+struct FaultCase {
+    const char* fault;
+    unsigned K;
+    int units;
+    int algorithm;
+    unsigned halfIteration;  ///< of the first difference
+    const char* operation;   ///< at fault
+    const char* found;       ///< the pattern; empty when none is known
+    int amplitude = 16;
+};
+
+std::ostream& operator<<(std::ostream& out, const FaultCase& each)
+{
+    return out << each.fault;
+}
+
+std::string softText(const blocks::Block& block)
+{
+    std::string text = header + '\n';
+    for (std::size_t i = 0; i < block.sys.size(); ++i) {
+        text += "0," + std::to_string(block.sys[i]) + ',' + std::to_string(block.par1[i]) + ',' +
+                std::to_string(block.par2[i]) + '\n';
+    }
+    return text;
+}
+
+class Compare : public CommandTest {
+protected:
+    void writeBlock(unsigned K, int amplitude = 16) const
+    {
+        blocks::Random random(1);
+        blocks::Block block = blocks::encode(blocks::randomBits(random, K), amplitude);
+        blocks::addNoise(random, 14, block);
+        morvik.write("block.csv", softText(block));
+    }
+
+    /// Has a core with the fault write rtl.csv.
+    void writeDump(const std::string& fault, int units, int algorithm) const
+    {
+        const CommandRunner core(MORVIK_FAULT_CORES "/fault_" + fault);
+        const CommandResult result = core.run({std::to_string(units), std::to_string(algorithm), "4"},
+                                              morvik.directory() + "/block.csv",
+                                              morvik.directory() + "/rtl.csv");
+        ASSERT_EQ(result.status, 0) << result.err;
+    }
+
+    CommandResult compare(const std::vector<std::string>& options = {}) const
+    {
+        std::vector<std::string> arguments = {
+            "compare", "--block", "block.csv", "--dump", "rtl.csv", "--iterations", "4"};
+        arguments.insert(arguments.end(), options.begin(), options.end());
+        return morvik.run(arguments);
+    }
+
+    void expectRefused(const CommandResult& result, const std::string& message) const
+    {
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(result.err, "morvik compare: " + message + '\n');
+    }
+};
+
+class FaultyCore : public Compare, public testing::WithParamInterface<FaultCase> {};
+
+bool has(const std::string& text, const std::string& part)
+{
+    return text.find(part) != std::string::npos;
+}
+
+TEST_P(FaultyCore, IsFoundAtItsPlace)
+{
+    const FaultCase& given = GetParam();
+    writeBlock(given.K, given.amplitude);
+    writeDump(given.fault, given.units, given.algorithm);
+    const CommandResult result =
+        compare({"--num-pu", std::to_string(given.units), "--algorithm", std::to_string(given.algorithm)});
+    EXPECT_EQ(result.status, 1) << result.err;
+    EXPECT_TRUE(has(result.out, "  half-iteration  " + std::to_string(given.halfIteration) + ", on the")) << result.out;
+    EXPECT_TRUE(has(result.out, std::string("At fault: ") + given.operation)) << result.out;
+    EXPECT_TRUE(has(result.out, given.found)) << result.out;
+    if (std::getenv("MORVIK_SHOW_REPORTS") != nullptr) {
+        std::cout << result.out;
+    }
+}
+
+const char* const intrinsic = "the intrinsic value";
+const char* const branch = "the branch metrics";
+const char* const forward = "the forward recursion";
+const char* const backward = "the backward recursion";
+const char* const ratio = "the log-likelihood ratio";
+const char* const extrinsic = "the extrinsic value";
+const char* const segmentBorder = "the border metrics at the start of the segment";
+const char* const windowBorder = "the border metrics at the start of the window";
+
+INSTANTIATE_TEST_SUITE_P(
+    Faults,
+    FaultyCore,
+    testing::Values(
+        FaultCase{"extrinsic_rounding", 512, 2, 1, 0, extrinsic, "one LSB too high: rounding"},
+        FaultCase{"intrinsic_rounding", 512, 2, 1, 1, intrinsic, "one LSB too high: rounding"},
+        FaultCase{"ratio_rounding", 512, 2, 1, 0, ratio, "one LSB too high: rounding"},
+        FaultCase{
+            "forward_bits_kept", 512, 2, 1, 2, segmentBorder, "the seven low bits of border metrics are not cleared"},
+        FaultCase{
+            "backward_bits_kept", 1088, 2, 1, 2, windowBorder, "the seven low bits of border metrics are not cleared"},
+        FaultCase{"forward_border_unknown", 512, 2, 1, 2, segmentBorder, "border metrics are zeros"},
+        FaultCase{"backward_border_early", 1024, 2, 1, 2, windowBorder, "border metrics are those of the other pass"},
+        FaultCase{"first_state_unknown", 512, 2, 1, 0, "the known state at the beginning", "border metrics are zeros"},
+        FaultCase{"tail_bits_kept", 512, 2, 1, 0, "the metrics of the tail", "the seven low bits of border metrics"},
+        FaultCase{"tail_sign", 512, 2, 1, 0, "the metrics of the tail", "at the tail alone"},
+        FaultCase{"ratio_sign", 512, 2, 1, 0, ratio, "the sign is flipped"},
+        FaultCase{"extrinsic_sign", 512, 2, 1, 0, extrinsic, "the sign is flipped"},
+        FaultCase{"parity_sign", 512, 2, 1, 0, branch, "the sign of the parity is flipped"},
+        FaultCase{"branch_unclipped", 512, 2, 1, 0, branch, "saturation is missing: the sum is wider", 80},
+        FaultCase{"branch_eight_bits", 512, 2, 1, 0, branch, "saturation is missing: the sum is cut", 80},
+        FaultCase{"extrinsic_unclipped", 512, 2, 1, 0, extrinsic, "saturation is missing: the sum is wider", 80},
+        FaultCase{"metrics_unwrapped", 512, 2, 1, 0, forward, "the wrap is missing", 80},
+        FaultCase{"apriori_late", 512, 2, 1, 1, intrinsic, "a pass late"},
+        FaultCase{"apriori_missing", 512, 2, 1, 1, intrinsic, "a pass late"},
+        FaultCase{"apriori_unpermuted", 512, 2, 1, 1, intrinsic, "without the interleaver's permutation"},
+        FaultCase{"systematic_unpermuted", 512, 2, 1, 0, intrinsic, "in the other code's order"},
+        FaultCase{"extrinsic_unscaled", 512, 2, 1, 0, extrinsic, "the factor of 0.75 is missing"},
+        FaultCase{"extrinsic_stuck_bit", 512, 2, 1, 0, extrinsic, "bit 0 is wrong"},
+        FaultCase{"backward_uncorrected", 512, 2, 2, 0, backward, "the correction table is missing"},
+        FaultCase{"forward_corrected_early", 512, 2, 2, 0, forward, "corrections come a decision early"},
+        FaultCase{"forward_state_swapped", 512, 2, 1, 0, forward, "no pattern that is known"}),
+    [](const testing::TestParamInfo<FaultCase>& each) { return std::string(each.param.fault); });
+
+TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
+{
+    for (const int algorithm : {0, 1, 2}) {
+        writeBlock(1088);
+        writeDump("none", 4, algorithm);
+        const CommandResult result = compare({"--num-pu", "4", "--algorithm", std::to_string(algorithm)});
+        EXPECT_EQ(result.status, 0) << result.out;
+        EXPECT_EQ(result.out, "rtl.csv: 200280 values compared, all as the model computes them\n");
+        EXPECT_EQ(result.err, "");
+    }
+}
+
+TEST_F(Compare, NamesBadFiles)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    const std::string good = morvik.read("rtl.csv");
+    expectRefused(compare({"--block-number", "1"}), "block.csv: has 1 block, there is no block 1");
+    expectRefused(compare({"--map", "none.json"}), "none.json: cannot be opened: No such file or directory");
+    morvik.write("rtl.csv", withLine(good, 9, "0,0,alpha3,2048"));
+    expectRefused(compare(),
+                  "rtl.csv:9: alpha3 \"2048\" is not allowed, expected an integer from -2048 to 2047, or a multiple of "
+                  "1/8 with a point from -256.0 to 255.875");
+    morvik.write("rtl.csv", "half_iteration,step,signal,value\n");
+    expectRefused(compare(), "rtl.csv: holds no value that the core computes");
+    morvik.write("block.csv", header + '\n' + zeroRows("0", 45));
+    expectRefused(compare(),
+                  "block.csv:2: block of 45 rows, allowed are K + 4 rows, K being one of the block sizes of 3GPP TS "
+                  "36.212 (40 to 6144)");
+}
+
+}  // namespace

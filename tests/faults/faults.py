@@ -1,0 +1,97 @@
+#!/usr/bin/env python3
+"""Writes the model's sources with a fault in each copy.
+
+  faults.py SOURCES OUT
+
+For each fault, OUT/NAME/ receives the unit to compile and, where the fault is in a header, that header. Prints a line
+"NAME UNIT" for each.
+"""
+
+import pathlib
+import sys
+
+DECODER = "TDecoder3G.cpp"
+SEGMENTS = "TDecoder3GPU.cpp"
+ENGINE = "TCalculationEngineModBase.cpp"
+
+# Name: the unit, the file that is changed, and pairs of what stands there and what is put in its place.
+FAULTS = {
+    "extrinsic_rounding": (DECODER, DECODER, [("value * scale;", "value * scale + 8;")]),
+    "intrinsic_rounding": (DECODER, DECODER, [("((apriori / 2) & stateMask)", "((apriori / 2 + 15) & stateMask)")]),
+    "extrinsic_unscaled": (DECODER, DECODER, [("value * scale;", "value * (scale < 1 ? 1 : scale);")]),
+    "extrinsic_unclipped": (DECODER, DECODER, [("shiftRight(branch.itsMin, spareBits)", "-32768"),
+                                               ("shiftRight(branch.itsMax, spareBits)", "32767"),
+                                               ("const std::uint32_t spareBits = state.itsNBits - branch.itsNBits;",
+                                                "static_cast<void>(branch);")]),
+    "extrinsic_sign": (DECODER, DECODER, [("maskBits(wrap16(extrinsic), mask)", "maskBits(wrap16(-extrinsic), mask)")]),
+    "extrinsic_stuck_bit": (DECODER, DECODER, [
+        ("maskBits(wrap16(extrinsic), mask)",
+         "maskBits(wrap16(j >= 64 && j < 128 ? extrinsic | 16 : extrinsic), mask)")]),
+    "apriori_late": (DECODER, DECODER, [
+        ("    const int mask = itsEngine->itsStateFormat->itsMask;\n    for",
+         "    const int mask = itsEngine->itsStateFormat->itsMask;\n"
+         "    static std::vector<std::vector<short>> held;\n"
+         "    held.resize(h);\n    held.push_back(itsExtrinsic);\n    for"),
+        ("j < K ? itsExtrinsic[from[j]] : 0", "j < K && h >= 2 ? held[h - 2][from[j]] : 0")]),
+    "apriori_missing": (DECODER, DECODER, [("j < K ? itsExtrinsic[from[j]] : 0", "from[j % K] > K ? 1 : 0")]),
+    "apriori_unpermuted": (DECODER, DECODER, [("j < K ? itsExtrinsic[from[j]]", "j < K && from[j] < K ? itsExtrinsic[j]")]),
+    "systematic_unpermuted": (DECODER, DECODER, [("itsSys[0][itsInterleaver->itsPi[i]]", "itsSys[0][i]")]),
+    "branch_unclipped": (ENGINE, ENGINE, [("wrap16(arithmetic::clip(sums[i], lo, hi))",
+                                           "wrap16(lo < hi ? sums[i] : 0)")]),
+    "branch_eight_bits": (ENGINE, ENGINE, [("wrap16(arithmetic::clip(sums[i], lo, hi))",
+                                            "wrap16(lo < hi ? static_cast<signed char>(sums[i] / 16) * 16 : 0)")]),
+    "parity_sign": (ENGINE, ENGINE, [("2 * intrinsic[k], parity0[k]", "2 * intrinsic[k], -parity0[k]")]),
+    "metrics_unwrapped": (ENGINE, "Arithmetic.h", [
+        ("return wrap16(std::int32_t{a} + b);",
+         "const std::int32_t sum = std::int32_t{a} + b;\n"
+         "    return wrap16(sum < -32768 ? -32768 : sum > 32752 ? 32752 : sum);"),
+        ("return wrap16(std::int32_t{a} - b);",
+         "const std::int32_t sum = std::int32_t{a} - b;\n"
+         "    return wrap16(sum < -32768 ? -32768 : sum > 32752 ? 32752 : sum);")]),
+    "ratio_sign": (ENGINE, "Trellis.h", [("subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g))",
+                                          "subWrap(bestPath<0>(rule, a, b, g), bestPath<1>(rule, a, b, g))")]),
+    "ratio_rounding": (ENGINE, "Trellis.h", [
+        ("return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));",
+         "return static_cast<Value>(subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g)) + "
+         "16 * (a[0] & 16 ? 1 : 0));")]),
+    "tail_sign": (SEGMENTS, "Trellis.h", [("{-e2 - e1 - g0,", "{-e2 - e1 + g0,")]),
+    "tail_bits_kept": (SEGMENTS, SEGMENTS, [("    *column = border(*column);\n", "")]),
+    "forward_bits_kept": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);", "starts[u] = reached;")]),
+    "forward_border_unknown": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);",
+                                                     "starts[u] = u == 0 ? border(reached) : T8{};")]),
+    "backward_bits_kept": (SEGMENTS, SEGMENTS, [("stored = border(reached);", "stored = reached;")]),
+    "backward_border_early": (SEGMENTS, SEGMENTS, [("i + 1 < starts.size() ? T8{} : held;",
+                                                    "i + 1 < starts.size() ? T8{} : starts[i];")]),
+    "first_state_unknown": (SEGMENTS, SEGMENTS, [("setInitialState(starts.data());",
+                                                  "preCalcAlpha(h, 0, starts.data());")]),
+    "backward_uncorrected": (ENGINE, ENGINE, [("backward(MaxHash(Corrections{itsBetaLUT}), n, g, b)",
+                                               "backward(Max{}, n, g, b)")]),
+    "forward_corrected_early": (ENGINE, ENGINE, [("forward(MaxHash(Corrections{itsAlphaLUT}), n, g, a)",
+                                                  "forward(MaxStar(Corrections{itsAlphaLUT}), n, g, a)")]),
+    "forward_state_swapped": (ENGINE, ENGINE, [
+        ("        store(rule, metrics, a[j]);", "        std::swap(metrics[2], metrics[3]);\n        store(rule, metrics, a[j]);")]),
+}
+
+
+def write_if_new(path, text):
+    """Leaves an unchanged file as it is, so that nothing is compiled again."""
+    if not path.exists() or path.read_text() != text:
+        path.parent.mkdir(parents=True, exist_ok=True)
+        path.write_text(text)
+
+
+def main():
+    sources, out = map(pathlib.Path, sys.argv[1:])
+    for name, (unit, changed, replacements) in FAULTS.items():
+        text = (sources / changed).read_text()
+        for before, after in replacements:
+            if text.count(before) != 1:
+                sys.exit(f"faults.py: {name}: {changed} has {text.count(before)} times {before!r}, expected once")
+            text = text.replace(before, after)
+        write_if_new(out / name / unit, (sources / unit).read_text())
+        write_if_new(out / name / changed, text)
+        print(name, unit)
+
+
+if __name__ == "__main__":
+    main()
