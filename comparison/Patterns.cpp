@@ -24,8 +24,8 @@ constexpr std::array<NamedMistake, 14> namedMistakes = {{
     {Mistake::borderBitsKept, "the seven low bits of border metrics are not cleared (rule 11)"},
     {Mistake::borderOfOtherPass,
      "border metrics are those of the other pass: this one's for the last one's, or the reverse (rule 20)"},
-    {Mistake::borderUnknown, "border metrics are zeros, as for an unknown state (rule 10)"},
-    {Mistake::aprioriMissing, "a pass late: the extrinsic values of the pass before do not arrive (rule 13)"},
+    {Mistake::borderUnknown, "start metrics are zeros, as for an unknown state (rule 10)"},
+    {Mistake::aprioriMissing, "the extrinsic values of the pass before do not arrive (rule 13)"},
     {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
     {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
     {Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"},
@@ -53,35 +53,9 @@ public:
         consider("a pass late: values are those of the last pass over the same code",
                  faults,
                  finding,
-                 [this](const Fault& fault) {
-                     return fault.place.pass >= 2
-                                ? fault.got == replayed(fault.place, fault.place.pass - 2, Mistake::none)
-                                : fault.got == 0;
-                 });
-        consider("the sign is flipped", faults, finding, [](const Fault& fault) {
-            return fault.got == std::min(-fault.wanted, +Values::largest);
-        });
-        consider("zeros", faults, finding, [](const Fault& fault) { return fault.got == 0; });
-        consider("one LSB too high: rounding", faults, finding, [](const Fault& fault) {
-            return fault.got == fault.wanted + 1;
-        });
-        consider("one LSB too low: rounding", faults, finding, [](const Fault& fault) {
-            return fault.got == fault.wanted - 1;
-        });
-        consider("off by one LSB: rounding", faults, finding, [](const Fault& fault) {
-            return std::abs(fault.got - fault.wanted) == 1;
-        });
-        for (const int step : {-1, 1}) {
-            consider(step < 0 ? "values of the step before" : "values of the step behind",
-                     faults,
-                     finding,
-                     [this, step](const Fault& fault) { return isOfOtherStep(fault, step); });
-        }
-        for (unsigned bit = 0; bit < 12; ++bit) {
-            consider("bit " + std::to_string(bit) + " is wrong", faults, finding, [bit](const Fault& fault) {
-                return ((fault.got ^ fault.wanted) & 0xFFF) == 1 << bit;
-            });
-        }
+                 [this](const Fault& fault) { return fault.got == valueOfLastPass(fault.place); });
+        explainByRelation(faults, finding);
+        explainByBits(faults, finding);
     }
 
 private:
@@ -100,6 +74,58 @@ private:
     {
         const Stage stage = stageOf(place.signal);
         return itsReplay.column(pass, stage, place.step, mistake).values[place.signal - signalsOf(stage).first];
+    }
+
+    /// How values that are wrong relate to those that are wanted.
+    void explainByRelation(const std::vector<Fault>& faults, Finding& finding) const
+    {
+        consider("the sign is flipped", faults, finding, [](const Fault& fault) {
+            return fault.got == -fault.wanted || fault.got == ~fault.wanted;
+        });
+        consider("zeros", faults, finding, [](const Fault& fault) { return fault.got == 0; });
+        consider("values of the step before", faults, finding, [this](const Fault& fault) {
+            return isOfOtherStep(fault, -1);
+        });
+        consider("values of the step behind", faults, finding, [this](const Fault& fault) {
+            return isOfOtherStep(fault, 1);
+        });
+    }
+
+    static void explainByBits(const std::vector<Fault>& faults, Finding& finding)
+    {
+        constexpr std::size_t fewest = 8;  // with fewer, other bits may be alike by chance
+        for (int bit = 0; faults.size() >= fewest && bit < 12; ++bit) {
+            const std::string text = "bit " + std::to_string(bit) + " is stuck at ";
+            consider(text + '1', faults, finding, [bit](const Fault& fault) {
+                return fault.got == (fault.wanted | 1 << bit);
+            });
+            consider(text + '0', faults, finding, [bit](const Fault& fault) {
+                return fault.got == (fault.wanted & ~(1 << bit));
+            });
+        }
+        consider("one LSB too high: rounding", faults, finding, [](const Fault& fault) {
+            return fault.got == fault.wanted + 1;
+        });
+        consider("one LSB too low: rounding", faults, finding, [](const Fault& fault) {
+            return fault.got == fault.wanted - 1;
+        });
+        consider("off by one LSB: rounding", faults, finding, [](const Fault& fault) {
+            return std::abs(fault.got - fault.wanted) == 1;
+        });
+        for (int bit = 1; bit < 12; ++bit) {
+            consider("bit " + std::to_string(bit) + " is flipped", faults, finding, [bit](const Fault& fault) {
+                return ((fault.got ^ fault.wanted) & 0xFFF) == 1 << bit;
+            });
+        }
+    }
+
+    /// Before the first pass over a code, there are no extrinsic values, and all else is 0.
+    int valueOfLastPass(const Place& place) const
+    {
+        if (place.pass >= 2) {
+            return replayed(place, place.pass - 2, Mistake::none);
+        }
+        return stageOf(place.signal) == Stage::intrinsic ? replayed(place, place.pass, Mistake::aprioriMissing) : 0;
     }
 
     bool isOfOtherStep(const Fault& fault, int step) const
@@ -213,7 +239,7 @@ std::string whereOf(const Division& division, const std::vector<Fault>& faults)
         append(text, "in " + std::string(signalNames[*signal]) + " alone");
     }
     const auto segment = common(faults, [&](const Place& place) { return place.step / division.segmentLength; });
-    if (segment && *segment > 0 && *segment < division.segments) {
+    if (kind == kinds.end() && segment && *segment > 0 && *segment < division.segments) {
         append(text, "in segment " + std::to_string(*segment) + " alone");
     }
     return text;

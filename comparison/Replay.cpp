@@ -157,17 +157,27 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned place, Mistake mist
 
 int Replay::twiceIntrinsic(unsigned pass, unsigned place, bool& complete) const
 {
-    // A dump lacks the bit below a step. It follows from the inputs, or, when the value has another reason than them,
-    // from the branch metrics.
+    // A dump lacks the bit below a step. Hardware whose intrinsic value has other reasons than the inputs may have
+    // another one there than follows from them: then what is computed with it tells.
     const int kept = input({pass, signalsOf(Stage::intrinsic).first, place}, complete);
     bool ignored = true;
     const int computed = twiceIntrinsicFromInputs(pass, place, Mistake::none, ignored);
-    if (((computed / 2) & stepMask) == kept) {
-        return computed;
+    const int likely = ((computed / 2) & stepMask) == kept ? computed : 2 * kept;
+    const int other = likely ^ step;
+    return !givesWhatFollows(pass, place, likely) && givesWhatFollows(pass, place, other) ? other : likely;
+}
+
+bool Replay::givesWhatFollows(unsigned pass, unsigned place, int twice) const
+{
+    if (place >= itsModel.division.K) {
+        return true;
     }
-    const auto found = inputs<Branches>(pass, Stage::branch, place, ignored);
-    const int upper = 2 * kept + step;
-    return branchMetrics(pass, place, upper, Mistake::none) == found ? upper : 2 * kept;
+    bool complete = true;
+    const auto branches = inputs<Branches>(pass, Stage::branch, place, complete);
+    const int ratio = input({pass, signalsOf(Stage::ratio).first, place}, complete);
+    const int extrinsic = input({pass, signalsOf(Stage::extrinsic).first, place}, complete);
+    return complete && branchMetrics(pass, place, twice, Mistake::none) == branches &&
+           extrinsicValue(ratio, twice, Mistake::none) == extrinsic;
 }
 
 Column Replay::intrinsicColumn(unsigned pass, unsigned place, Mistake mistake) const
@@ -339,15 +349,21 @@ Column Replay::ratioColumn(unsigned pass, unsigned place, Mistake mistake) const
     return inSteps(std::array<std::int16_t, 1>{word}, complete);
 }
 
+int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const
+{
+    int value = ratio - 2 * twice;
+    if (itsModel.generics.C_ALGORITHM_TYPE == 1 && mistake != Mistake::unscaled) {
+        value = 3 * value / 4;  // rule 14
+    }
+    return narrowed(value, mistake) & stepMask;
+}
+
 Column Replay::extrinsicColumn(unsigned pass, unsigned place, Mistake mistake) const
 {
     bool complete = true;
     const int ratio = input({pass, signalsOf(Stage::ratio).first, place}, complete);
-    int value = ratio - 2 * twiceIntrinsic(pass, place, complete);
-    if (itsModel.generics.C_ALGORITHM_TYPE == 1 && mistake != Mistake::unscaled) {
-        value = 3 * value / 4;  // rule 14
-    }
-    return inSteps(std::array<int, 1>{narrowed(value, mistake) & stepMask}, complete);
+    const int twice = twiceIntrinsic(pass, place, complete);
+    return inSteps(std::array<int, 1>{extrinsicValue(ratio, twice, mistake)}, complete);
 }
 
 }  // namespace morvik::comparison

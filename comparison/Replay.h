@@ -56,6 +56,8 @@ private:
 
     int twiceIntrinsicFromInputs(unsigned pass, unsigned step, Mistake mistake, bool& complete) const;
     int twiceIntrinsic(unsigned pass, unsigned step, bool& complete) const;
+    bool givesWhatFollows(unsigned pass, unsigned step, int twice) const;
+    int extrinsicValue(int ratio, int twice, Mistake mistake) const;
     Branches branchMetrics(unsigned pass, unsigned step, int twice, Mistake mistake) const;
     /// The column to which a recursion comes from the step `from`. `hasEarlier` tells whether it came there from
     /// another step, whose decisions may have left corrections pending.

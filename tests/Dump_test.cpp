@@ -217,7 +217,7 @@ TEST(VcdDump, NamesThePlaceOfAMistake)
                   "dump:5: no variable of the dump is a signal that is known; a map tells which is which");
     expectRefused(readVcd,
                   start + ratio + end + "#0\nb1 s\nb1 l\n",
-                  R"(dump:9: no variable "half_iteration" in the scope of "llr" or around it)");
+                  R"(dump:8: no variable "half_iteration" in the scope of "llr" or around it)");
     expectRefused(readVcd, start + pass + ratio + end + "#0\nb1 q\n", R"(dump:8: no variable has the identifier "q")");
     expectRefused(readVcd, start + pass + ratio + end + "hello\n", R"(dump:7: "hello" is no change of a value)");
     expectRefused(readVcd, start + "$comment", "dump:3: a command without $end");
