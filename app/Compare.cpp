@@ -73,7 +73,8 @@ int compare(const Options& options)
 {
     const SoftBlock block = readBlock(options.block, options.number);
     const comparison::NameMap map = readMap(options.map);
-    const comparison::Model model(block, options.decoder.generics, options.decoder.iterations);
+    const comparison::Model model =
+        comparison::computeModel(block, options.decoder.generics, options.decoder.iterations);
     comparison::Dump dump(model.values.passes(), model.values.steps());
     InputFile input(options.dump);
     (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);

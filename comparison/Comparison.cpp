@@ -16,7 +16,7 @@ public:
     {
         for (unsigned pass = 0; pass < itsDump.passes(); ++pass) {
             for (const Stage stage : stages) {
-                for (const unsigned step : stepsInOrder(itsModel.division, stage)) {
+                for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
                     compareColumn(pass, stage, step);
                 }
             }
@@ -88,7 +88,7 @@ private:
         const Stage stage = stageOf(itsResult.first->signal);
         const auto [first, count] = signalsOf(stage);
         const unsigned pass = itsResult.first->pass;
-        for (const unsigned step : stepsInOrder(itsModel.division, stage)) {
+        for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
             for (unsigned i = 0; i < count; ++i) {
                 const Place place = {pass, first + i, step};
                 if (itsDump.has(place) && itsDump.at(place) != itsModel.values.at(place)) {
@@ -131,28 +131,28 @@ std::vector<InputState> columnInputs(Stage stage, unsigned pass, unsigned step)
     return {inputAt(stage, pass, step), inputAt(Stage::branch, pass, step)};
 }
 
-std::vector<InputState> forwardInputs(const Division& division, const Place& place)
+std::vector<InputState> forwardInputs(const Windows& windows, const Place& place)
 {
     if (place.step == 0) {
         return {};
     }
-    const bool isStart = place.step < division.K && place.step % division.segmentLength == 0;
+    const bool isStart = place.step < windows.K && place.step % windows.segmentLength == 0;
     if (isStart && place.pass < 2) {
         return {};
     }
     return columnInputs(Stage::forward, isStart ? place.pass - 2 : place.pass, place.step - 1);
 }
 
-std::vector<InputState> backwardInputs(const Division& division, const Place& place)
+std::vector<InputState> backwardInputs(const Windows& windows, const Place& place)
 {
-    const Window& window = division.windowAt(place.step);
+    const Window& window = windows.at(place.step);
     if (place.step < window.last) {
         return columnInputs(Stage::backward, place.pass, place.step + 1);
     }
-    if (division.isFinal(window) || place.pass < 2) {
+    if (windows.isFinal(window) || place.pass < 2) {
         return {};
     }
-    const bool ofThisPass = division.rows >= 3 && window.row + 1 == division.rows;  // rule 20
+    const bool ofThisPass = windows.rows >= 3 && window.row + 1 == windows.rows;  // rule 20
     return columnInputs(Stage::backward, ofThisPass ? place.pass : place.pass - 2, place.step + 1);
 }
 
@@ -172,16 +172,16 @@ std::vector<InputState> inputsOf(const Model& model, const Place& place)
 {
     switch (stageOf(place.signal)) {
     case Stage::intrinsic:
-        if (place.pass == 0 || place.step >= model.division.K) {
+        if (place.pass == 0 || place.step >= model.windows.K) {
             return {};
         }
         return {inputAt(Stage::extrinsic, place.pass - 1, model.codes[codeOf(place.pass)].order[place.step])};
     case Stage::branch:
         return {inputAt(Stage::intrinsic, place.pass, place.step)};
     case Stage::forward:
-        return forwardInputs(model.division, place);
+        return forwardInputs(model.windows, place);
     case Stage::backward:
-        return backwardInputs(model.division, place);
+        return backwardInputs(model.windows, place);
     case Stage::ratio:
         return {inputAt(Stage::forward, place.pass, place.step),
                 inputAt(Stage::backward, place.pass, place.step),

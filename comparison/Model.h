@@ -14,31 +14,23 @@ namespace morvik::comparison {
 
 /// A window of the backward recursion: trellis steps.
 struct Window {
-    unsigned segment;
     unsigned row;  ///< which window of its segment
     unsigned first;
     unsigned last;
 };
 
-/// How a block is cut (docs/arithmetic.md, rules 17 and 18).
-struct Division {
+/// The segments and windows of a block (docs/arithmetic.md, rules 17 and 18).
+struct Windows {
     unsigned K = 0;
-    unsigned numPu = 0;
     unsigned segments = 0;
     unsigned segmentLength = 0;
     unsigned rows = 0;
-    std::vector<Window> windows;     ///< in the order in which they are computed
-    std::vector<unsigned> windowOf;  ///< the window of each of the K steps
+    std::vector<Window> inOrder;   ///< in the order in which they are computed, one of each segment, row by row
+    std::vector<unsigned> ofStep;  ///< the window of each of the K steps
 
-    /// Neighbouring segments share a unit.
-    unsigned unitOf(unsigned segment) const
+    const Window& at(unsigned step) const
     {
-        return segment / (segments > numPu ? segments / numPu : 1);
-    }
-
-    const Window& windowAt(unsigned step) const
-    {
-        return windows[windowOf[step]];
+        return inOrder[ofStep[step]];
     }
 
     /// Whether no window follows: its backward recursion starts from the tail.
@@ -63,18 +55,19 @@ constexpr unsigned codeOf(unsigned pass)
 }
 
 struct Model {
-    /// Decodes the block by the components. Throws morvik::Refusal when the library refuses.
-    Model(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, unsigned iterations);
-
     veltra_ip_morvik_v1_0_generics generics;
-    Division division;
-    std::array<Code, 2> codes;
     Values values;  ///< those that the core computes, and no others
+    Division division;
+    Windows windows;
+    std::array<Code, 2> codes;
 };
+
+/// Decodes the block. Throws Refusal when the library refuses.
+Model computeModel(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, unsigned iterations);
 
 /// The steps of a stage in the order in which the core computes them: the segments at the same time, the backward
 /// recursion window by window from its end.
-std::vector<unsigned> stepsInOrder(const Division& division, Stage stage);
+std::vector<unsigned> stepsInOrder(const Windows& windows, Stage stage);
 
 }  // namespace morvik::comparison
 

@@ -135,13 +135,13 @@ private:
         }
         for (const auto& [theirs, ours] : value.items()) {
             const auto* const found = std::find_if(
-                signalNames.begin(), signalNames.end(), [&own = ours](const char* each) { return own == each; });
-            if (found == signalNames.end() && !ours.is_null()) {
+                passSignals.begin(), passSignals.end(), [&own = ours](const char* each) { return own == each; });
+            if (found == passSignals.end() && !ours.is_null()) {
                 fail("signal " + shown(theirs) + " is " + ours.dump() +
                      ", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic, and null");
             }
             map.signals[theirs] =
-                ours.is_null() ? NameMap::leftOut : static_cast<unsigned>(found - signalNames.begin());
+                ours.is_null() ? NameMap::leftOut : static_cast<unsigned>(found - passSignals.begin());
         }
     }
 
@@ -172,7 +172,7 @@ private:
 NameMap::NameMap()
 {
     for (unsigned i = 0; i < signalCount; ++i) {
-        signals[signalNames[i]] = i;
+        signals[passSignals[i]] = i;
     }
 }
 

@@ -23,7 +23,7 @@ enum class NumberForm : std::uint8_t {
 
 /// Read from a JSON object, whose keys may all be left out:
 ///   "columns"   of CSV, or variables of VCD: {"half_iteration": NAME, "step": NAME, "signal": NAME, "value": NAME}
-///   "signals"   {NAME: SIGNAL or null, ...}: SIGNAL is one of signalNames; null leaves the signal out
+///   "signals"   {NAME: SIGNAL or null, ...}: SIGNAL is one of passSignals; null leaves the signal out
 ///   "numbers"   auto, integer, unsigned, real, hex or binary
 ///   "bits"      of a number in two's complement, 12 when left out
 ///   "first_half_iteration", "first_step"   what the dump counts from, 0 when left out
@@ -36,14 +36,14 @@ struct NameMap {
     std::string stepColumn = "step";
     std::string signalColumn = "signal";
     std::string valueColumn = "value";
-    std::map<std::string, unsigned, std::less<>> signals;  ///< to places in signalNames, or leftOut
+    std::map<std::string, unsigned, std::less<>> signals;  ///< to places in passSignals, or leftOut
     NumberForm numbers = NumberForm::automatic;
     unsigned bits = 12;
     unsigned firstPass = 0;
     unsigned firstStep = 0;
     std::string valid;
 
-    /// Without a file: the names of signalNames.
+    /// Without a file: the names of passSignals.
     NameMap();
 
     /// The signal that a dump calls so.

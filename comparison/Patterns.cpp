@@ -131,7 +131,7 @@ private:
     bool isOfOtherStep(const Fault& fault, int step) const
     {
         const Place& place = fault.place;
-        const bool exists = step > 0 ? place.step + 1 < itsModel.division.K : place.step > 0;
+        const bool exists = step > 0 ? place.step + 1 < itsModel.windows.K : place.step > 0;
         return exists &&
                fault.got == itsModel.values.at({place.pass, place.signal, step > 0 ? place.step + 1 : place.step - 1});
     }
@@ -144,17 +144,17 @@ private:
 /// A kind of place in a block.
 struct Kind {
     const char* text;
-    bool (*matches)(const Division&, const Place&);
+    bool (*matches)(const Windows&, const Place&);
 };
 
-bool startsSegment(const Division& division, const Place& place)
+bool startsSegment(const Windows& windows, const Place& place)
 {
-    return place.step < division.K && place.step % division.segmentLength == 0;
+    return place.step < windows.K && place.step % windows.segmentLength == 0;
 }
 
-bool startsWindow(const Division& division, const Place& place)
+bool startsWindow(const Windows& windows, const Place& place)
 {
-    return place.step < division.K && division.windowAt(place.step).last == place.step;
+    return place.step < windows.K && windows.at(place.step).last == place.step;
 }
 
 constexpr bool isForward(const Place& place)
@@ -170,35 +170,35 @@ constexpr bool isBackward(const Place& place)
 /// The narrow ones first.
 constexpr std::array<Kind, 8> kinds = {{
     {"at the beginning of segment 0 alone",
-     [](const Division&, const Place& place) {
+     [](const Windows&, const Place& place) {
          return isForward(place) && place.step == 0;
      }},
     {"at the tail alone: where the last window starts",
-     [](const Division& division, const Place& place) {
-         return isBackward(place) && place.step + 1 == division.K;
+     [](const Windows& windows, const Place& place) {
+         return isBackward(place) && place.step + 1 == windows.K;
      }},
     {"in the tail alone",
-     [](const Division& division, const Place& place) {
-         return place.step >= division.K;
+     [](const Windows& windows, const Place& place) {
+         return place.step >= windows.K;
      }},
     {"at window edges alone: where segments start",
-     [](const Division& division, const Place& place) {
-         return isForward(place) && startsSegment(division, place);
+     [](const Windows& windows, const Place& place) {
+         return isForward(place) && startsSegment(windows, place);
      }},
     {"at window edges alone: where windows start",
-     [](const Division& division, const Place& place) {
-         return isBackward(place) && startsWindow(division, place);
+     [](const Windows& windows, const Place& place) {
+         return isBackward(place) && startsWindow(windows, place);
      }},
     {"in segment 0 alone",
-     [](const Division& division, const Place& place) {
-         return division.segments > 1 && place.step < division.segmentLength;
+     [](const Windows& windows, const Place& place) {
+         return windows.segments > 1 && place.step < windows.segmentLength;
      }},
     {"on the natural code alone",
-     [](const Division&, const Place& place) {
+     [](const Windows&, const Place& place) {
          return codeOf(place.pass) == 0;
      }},
     {"on the interleaved code alone",
-     [](const Division&, const Place& place) {
+     [](const Windows&, const Place& place) {
          return codeOf(place.pass) == 1;
      }},
 }};
@@ -218,7 +218,7 @@ void append(std::string& text, const std::string& part)
     text += (text.empty() ? "" : ", ") + part;
 }
 
-std::string whereOf(const Division& division, const std::vector<Fault>& faults)
+std::string whereOf(const Windows& windows, const std::vector<Fault>& faults)
 {
     std::string text;
     if (faults.size() == 1) {
@@ -226,7 +226,7 @@ std::string whereOf(const Division& division, const std::vector<Fault>& faults)
     }
     const auto* const kind = std::find_if(kinds.begin(), kinds.end(), [&](const Kind& each) {
         return std::all_of(
-            faults.begin(), faults.end(), [&](const Fault& fault) { return each.matches(division, fault.place); });
+            faults.begin(), faults.end(), [&](const Fault& fault) { return each.matches(windows, fault.place); });
     });
     if (kind != kinds.end()) {
         append(text, kind->text);
@@ -236,10 +236,10 @@ std::string whereOf(const Division& division, const std::vector<Fault>& faults)
     }
     const auto signal = common(faults, [](const Place& place) { return place.signal; });
     if (signal && signalsOf(stageOf(*signal)).count > 1) {
-        append(text, "in " + std::string(signalNames[*signal]) + " alone");
+        append(text, "in " + std::string(passSignals[*signal]) + " alone");
     }
-    const auto segment = common(faults, [&](const Place& place) { return place.step / division.segmentLength; });
-    if (kind == kinds.end() && segment && *segment > 0 && *segment < division.segments) {
+    const auto segment = common(faults, [&](const Place& place) { return place.step / windows.segmentLength; });
+    if (kind == kinds.end() && segment && *segment > 0 && *segment < windows.segments) {
         append(text, "in segment " + std::to_string(*segment) + " alone");
     }
     return text;
@@ -287,7 +287,7 @@ std::vector<Finding> findPatterns(const Model& model, const Values& dump, const 
         Finding finding{};
         finding.stage = stage;
         finding.faults = ofStage.size();
-        finding.where = whereOf(model.division, ofStage);
+        finding.where = whereOf(model.windows, ofStage);
         explainer.explain(ofStage, finding);
         findings.push_back(finding);
     }

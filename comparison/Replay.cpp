@@ -83,9 +83,9 @@ void takePending(trellis::PendingMetric<Value>& metric, const trellis::PendingMe
     metric.pending = from.pending;
 }
 
-bool startsSegment(const Division& division, unsigned place)
+bool startsSegment(const Windows& windows, unsigned place)
 {
-    return place < division.K && place % division.segmentLength == 0;
+    return place < windows.K && place % windows.segmentLength == 0;
 }
 
 template <class Words>
@@ -144,7 +144,7 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned place, Mistake mist
 {
     const unsigned d = codeOf(pass);
     const Code& code = itsModel.codes[d];
-    const bool isTail = place >= itsModel.division.K;
+    const bool isTail = place >= itsModel.windows.K;
     int apriori = 0;
     if (!isTail && pass > 0 && mistake != Mistake::aprioriMissing) {
         const unsigned from = mistake == Mistake::aprioriUnpermuted ? place : code.order[place];
@@ -169,7 +169,7 @@ int Replay::twiceIntrinsic(unsigned pass, unsigned place, bool& complete) const
 
 bool Replay::givesWhatFollows(unsigned pass, unsigned place, int twice) const
 {
-    if (place >= itsModel.division.K) {
+    if (place >= itsModel.windows.K) {
         return true;
     }
     bool complete = true;
@@ -272,19 +272,19 @@ Replay::Metrics Replay::forwardStart(unsigned pass, unsigned segment, Mistake mi
     if (pass < 2 || segment == 0) {
         return {};
     }
-    const unsigned length = itsModel.division.segmentLength;
+    const unsigned length = itsModel.windows.segmentLength;
     return border(reached(pass - 2, Stage::forward, segment * length - 1, length > 1, mistake, complete), mistake);
 }
 
 Column Replay::forwardColumn(unsigned pass, unsigned place, Mistake mistake) const
 {
     bool complete = true;
-    const Division& division = itsModel.division;
-    if (startsSegment(division, place)) {
-        const Metrics start = forwardStart(pass, place / division.segmentLength, mistake, complete);
+    const Windows& windows = itsModel.windows;
+    if (startsSegment(windows, place)) {
+        const Metrics start = forwardStart(pass, place / windows.segmentLength, mistake, complete);
         return inSteps(start, complete);
     }
-    const bool hasEarlier = !startsSegment(division, place - 1);
+    const bool hasEarlier = !startsSegment(windows, place - 1);
     const Metrics next = reached(pass, Stage::forward, place - 1, hasEarlier, mistake, complete);
     return inSteps(next, complete);
 }
@@ -294,8 +294,8 @@ Replay::Metrics Replay::tail(unsigned pass) const
     const Code& code = itsModel.codes[codeOf(pass)];
     trellis::Tail<int> steps{};
     for (unsigned i = 0; i < 3; ++i) {
-        steps.x[i] = code.systematic[itsModel.division.K + i];
-        steps.p[i] = code.parity[itsModel.division.K + i];
+        steps.x[i] = code.systematic[itsModel.windows.K + i];
+        steps.p[i] = code.parity[itsModel.windows.K + i];
     }
     Metrics column{};
     const auto metrics = trellis::tailColumn(steps);
@@ -307,25 +307,25 @@ Replay::Metrics Replay::tail(unsigned pass) const
 
 Replay::Metrics Replay::backwardStart(unsigned pass, const Window& window, Mistake mistake, bool& complete) const
 {
-    const Division& division = itsModel.division;
-    if (division.isFinal(window)) {
+    const Windows& windows = itsModel.windows;
+    if (windows.isFinal(window)) {
         return border(tail(pass), mistake);
     }
     if (pass < 2) {
         return {};
     }
     // Rule 20: the last row of three or more starts from what the first row has just left.
-    bool ofThisPass = division.rows >= 3 && window.row + 1 == division.rows;
+    bool ofThisPass = windows.rows >= 3 && window.row + 1 == windows.rows;
     ofThisPass = ofThisPass != (mistake == Mistake::borderOfOtherPass);
     const unsigned from = window.last + 1;
-    const bool hasEarlier = from < division.windowAt(from).last;
+    const bool hasEarlier = from < windows.at(from).last;
     return border(reached(ofThisPass ? pass : pass - 2, Stage::backward, from, hasEarlier, mistake, complete), mistake);
 }
 
 Column Replay::backwardColumn(unsigned pass, unsigned place, Mistake mistake) const
 {
     bool complete = true;
-    const Window& window = itsModel.division.windowAt(place);
+    const Window& window = itsModel.windows.at(place);
     if (place == window.last) {
         const Metrics start = backwardStart(pass, window, mistake, complete);
         return inSteps(start, complete);

@@ -91,28 +91,27 @@ public:
 private:
     void addPlace(const Place& place)
     {
-        const Division& division = itsModel.division;
+        const Windows& windows = itsModel.windows;
         itsText += "First difference, in the order of computation (" + itsName + ':' +
                    std::to_string(itsDump.lineOf(place)) + "):\n";
         itsText += format("  half-iteration  %u, on the %s code\n", place.pass, codeName(place.pass));
-        const unsigned step = std::min(place.step, division.K - 1);
-        const unsigned segment = step / division.segmentLength;
-        const Window& window = division.windowAt(step);
-        itsText += format("  unit            %u of %u\n", division.unitOf(segment), division.numPu);
+        const StepPlace where = itsModel.division.placeOf(place.step);
+        const Window& window = windows.at(std::min(place.step, windows.K - 1));
+        itsText += format("  unit            %u, thread %u\n", where.unit, where.thread);
         itsText += format("  segment         %u of %u, steps %u to %u\n",
-                          segment,
-                          division.segments,
-                          segment * division.segmentLength,
-                          (segment + 1) * division.segmentLength - 1);
+                          where.segment,
+                          windows.segments,
+                          where.segment * windows.segmentLength,
+                          (where.segment + 1) * windows.segmentLength - 1);
         itsText += format(
-            "  window          %u of %u, steps %u to %u\n", window.row, division.rows, window.first, window.last);
+            "  window          %u of %u, steps %u to %u\n", where.window, windows.rows, window.first, window.last);
         itsText += format("  trellis step    %u, %s\n", place.step, bitText(place).c_str());
-        itsText += format("  signal          %s\n\n", signalNames[place.signal]);
+        itsText += format("  signal          %s\n\n", passSignals[place.signal]);
     }
 
     std::string bitText(const Place& place) const
     {
-        if (place.step >= itsModel.division.K) {
+        if (place.step >= itsModel.windows.K) {
             return "behind the bits";
         }
         const unsigned bit = codeOf(place.pass) == 0 ? place.step : itsModel.codes[1].order[place.step];
@@ -194,16 +193,16 @@ private:
     /// The operation that gives a value, a start column among them.
     std::string startText(const Place& place) const
     {
-        const Division& division = itsModel.division;
+        const Windows& windows = itsModel.windows;
         const Stage stage = stageOf(place.signal);
-        if (stage == Stage::forward && place.step % division.segmentLength == 0 && place.step < division.K) {
+        if (stage == Stage::forward && place.step % windows.segmentLength == 0 && place.step < windows.K) {
             return place.step == 0  ? "the known state at the beginning (rule 10)"
                    : place.pass < 2 ? "the unknown state at the start of the segment (rules 10 and 19)"
                                     : "the border metrics at the start of the segment (rules 11 and 19), or the step "
                                       "that leads to them";
         }
-        if (stage == Stage::backward && division.windowAt(place.step).last == place.step) {
-            return division.isFinal(division.windowAt(place.step)) ? "the metrics of the tail (rule 12)"
+        if (stage == Stage::backward && windows.at(place.step).last == place.step) {
+            return windows.isFinal(windows.at(place.step)) ? "the metrics of the tail (rule 12)"
                    : place.pass < 2 ? "the unknown state at the start of the window (rules 10 and 20)"
                                     : "the border metrics at the start of the window (rules 11 and 20), or the step "
                                       "that leads to them";
@@ -221,7 +220,7 @@ private:
                 continue;
             }
             itsText += format("%-10s%10llu%12llu%10llu",
-                              signalNames[i],
+                              passSignals[i],
                               static_cast<unsigned long long>(count.compared),
                               static_cast<unsigned long long>(count.different),
                               static_cast<unsigned long long>(count.faults));

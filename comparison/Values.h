@@ -7,6 +7,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "testbench/Passes.h"
+
 namespace morvik::comparison {
 
 /// The operations of a pass, in their order.
@@ -15,15 +17,9 @@ enum class Stage : std::uint8_t { intrinsic, branch, forward, backward, ratio, e
 constexpr std::array<Stage, 6> stages = {
     Stage::intrinsic, Stage::branch, Stage::forward, Stage::backward, Stage::ratio, Stage::extrinsic};
 
-/// The signals, stage by stage.
-constexpr std::array<const char*, 23> signalNames = {"intrinsic", "g0",     "g1",     "g2",     "g3",       "alpha0",
-                                                     "alpha1",    "alpha2", "alpha3", "alpha4", "alpha5",   "alpha6",
-                                                     "alpha7",    "beta0",  "beta1",  "beta2",  "beta3",    "beta4",
-                                                     "beta5",     "beta6",  "beta7",  "llr",    "extrinsic"};
+constexpr unsigned signalCount = passSignals.size();
 
-constexpr unsigned signalCount = signalNames.size();
-
-/// The signals of a stage.
+/// The signals of a stage in passSignals.
 struct SignalRange {
     unsigned first;
     unsigned count;

@@ -48,6 +48,11 @@ const Division& Passes::division() const
     return *itsDivision;
 }
 
+const TDecoder3GPU& Passes::component() const
+{
+    return itsComponent;
+}
+
 void Passes::next()
 {
     itsComponent.calcSISO(itsNext);

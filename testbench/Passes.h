@@ -34,6 +34,9 @@ public:
 
     const Division& division() const;
 
+    /// The component that computes, with the streams of both constituent codes.
+    const TDecoder3GPU& component() const;
+
     /// Computes the next half-iteration, at first 0.
     void next();
 

@@ -25,7 +25,7 @@ Model modelOf(unsigned K, int units, int algorithm, unsigned iterations, unsigne
     auto generics = veltra_ip_morvik_v1_0_get_default_generics();
     generics.C_NUM_PU = units;
     generics.C_ALGORITHM_TYPE = algorithm;
-    return {noisyBlock(K, seed), generics, iterations};
+    return computeModel(noisyBlock(K, seed), generics, iterations);
 }
 
 /// Sizes of one segment and of several, with one, two, three and more windows in each.
@@ -101,13 +101,13 @@ TEST(Replay, GivesWhatMistakesGive)
 TEST(StepsInOrder, TakeTheSegmentsTogether)
 {
     const Model model = modelOf(512, 8, 1, 1);
-    const auto forward = stepsInOrder(model.division, Stage::forward);
+    const auto forward = stepsInOrder(model.windows, Stage::forward);
     ASSERT_EQ(forward.size(), 513U);
     EXPECT_EQ(forward[0], 0U);
     EXPECT_EQ(forward[1], 64U);
     EXPECT_EQ(forward[8], 1U);
     EXPECT_EQ(forward[512], 512U);
-    const auto backward = stepsInOrder(model.division, Stage::backward);
+    const auto backward = stepsInOrder(model.windows, Stage::backward);
     ASSERT_EQ(backward.size(), 512U);
     EXPECT_EQ(backward[0], 63U);
     EXPECT_EQ(backward[1], 127U);

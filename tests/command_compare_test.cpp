@@ -1,6 +1,7 @@
 // The command morvik compare: dumps of cores with a fault, and of the core itself.
 #include <cstdlib>
 #include <ostream>
+#include <sstream>
 
 #include "support/Blocks.h"
 #include "support/CommandTest.h"
@@ -148,6 +149,78 @@ TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
         EXPECT_EQ(result.out, "rtl.csv: 200280 values compared, all as the model computes them\n");
         EXPECT_EQ(result.err, "");
     }
+}
+
+TEST_F(Compare, AgreesWithTheTraceOfTheModel)
+{
+    writeBlock(1088);
+    for (const char* const format : {"csv", "vcd"}) {
+        const std::string file = std::string("trace.") + format;
+        const CommandResult traced =
+            morvik.run({"trace", "block.csv", "--iterations", "4", "--format", format, "--output", file});
+        ASSERT_EQ(traced.status, 0) << traced.err;
+        const CommandResult result =
+            morvik.run({"compare", "--block", "block.csv", "--iterations", "4", "--dump", file});
+        EXPECT_EQ(result.status, 0) << result.out;
+        EXPECT_EQ(result.out, file + ": 200280 values compared, all as the model computes them\n");
+    }
+}
+
+TEST_F(Compare, FindsAFaultInAWaveform)
+{
+    writeBlock(40);
+    morvik.run({"trace", "block.csv", "--iterations", "4", "--format", "vcd", "--output", "trace.vcd"});
+    std::string text = morvik.read("trace.vcd");
+    // The variable of the ratio, and its value in step 5 of the first pass, at time 5.
+    const std::size_t variable = text.rfind(' ', text.find(" llr [11:0]") - 1) + 1;
+    const std::string code = text.substr(variable, text.find(' ', variable) - variable);
+    const std::size_t change = text.find(" " + code + "\n", text.find("\n#5\n"));
+    text[change - 1] = text[change - 1] == '0' ? '1' : '0';
+    morvik.write("trace.vcd", text);
+    const CommandResult result =
+        morvik.run({"compare", "--block", "block.csv", "--iterations", "4", "--dump", "trace.vcd"});
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "  trellis step    5, bit")) << result.out;
+    EXPECT_TRUE(has(result.out, "At fault: the log-likelihood ratio (rule 8).")) << result.out;
+    EXPECT_TRUE(has(result.out, "Found in log-likelihood ratios, 1 fault, at one place alone:\n")) << result.out;
+}
+
+TEST_F(Compare, TellsWhatADumpOfRatiosAloneTells)
+{
+    writeBlock(512);
+    writeDump("ratio_sign", 2, 1);
+    std::string ratios = "half_iteration,step,signal,value\n";
+    std::istringstream all(morvik.read("rtl.csv"));
+    for (std::string line; std::getline(all, line);) {
+        ratios += has(line, ",llr,") ? line + '\n' : "";
+    }
+    morvik.write("rtl.csv", ratios);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "  half-iteration  0, on the")) << result.out;
+    EXPECT_TRUE(has(result.out, "input alpha      of half-iteration 0, step 0: not in the dump")) << result.out;
+    EXPECT_TRUE(has(result.out, "At fault: the log-likelihood ratio (rule 8), or what stands before it")) << result.out;
+    EXPECT_TRUE(has(result.out, "the sign is flipped")) << result.out;
+}
+
+TEST_F(Compare, TellsThatADumpCountsInAnotherWay)
+{
+    writeBlock(512);
+    writeDump("none", 2, 1);
+    std::string later = "half_iteration,step,signal,value\n";
+    std::istringstream all(morvik.read("rtl.csv"));
+    std::string line;
+    std::getline(all, line);
+    while (std::getline(all, line)) {
+        const int pass = std::stoi(line) + 1;
+        later += pass < 8 ? std::to_string(pass) + line.substr(line.find(',')) + '\n' : "";
+    }
+    morvik.write("rtl.csv", later);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "Found: the dump is a pass late, or counts half-iterations from 1;")) << result.out;
+    morvik.write("map.json", R"({"first_half_iteration": 1})");
+    EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
 }
 
 TEST_F(Compare, NamesBadFiles)

@@ -38,7 +38,8 @@ void write(const Values& values)
             for (unsigned signal = 0; signal < signalCount; ++signal) {
                 const Place place = {pass, signal, step};
                 if (values.has(place)) {
-                    std::cout << pass << ',' << step << ',' << signalNames[signal] << ',' << values.at(place) << '\n';
+                    std::cout << pass << ',' << step << ',' << morvik::passSignals[signal] << ',' << values.at(place)
+                              << '\n';
                 }
             }
         }
@@ -57,6 +58,6 @@ int main(int argc, char** argv)
     veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
     generics.C_NUM_PU = std::atoi(argv[1]);
     generics.C_ALGORITHM_TYPE = std::atoi(argv[2]);
-    write(Model(readBlock(std::cin), generics, static_cast<unsigned>(std::atoi(argv[3]))).values);
+    write(computeModel(readBlock(std::cin), generics, static_cast<unsigned>(std::atoi(argv[3]))).values);
     return 0;
 }
