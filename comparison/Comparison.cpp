@@ -5,9 +5,6 @@ namespace morvik::comparison {
 
 namespace {
 
-/// Faults beyond these are counted, but not looked at: patterns show earlier.
-constexpr std::size_t mostFaults = 20000;
-
 class Comparer {
 public:
     Comparer(const Model& model, const Values& dump) : itsModel(model), itsDump(dump), itsReplay(model, dump) {}
@@ -77,9 +74,7 @@ private:
         }
         if (complete && got != wanted) {
             ++count.faults;
-            if (itsResult.faults.size() < mostFaults) {
-                itsResult.faults.push_back({place, got, wanted});
-            }
+            itsResult.faults.push_back({place, got, wanted});
         }
     }
 

@@ -41,7 +41,7 @@ struct Comparison {
     std::array<SignalCount, signalCount> signals;
     std::optional<Place> first;      ///< difference, in the order of computation
     std::vector<InputState> inputs;  ///< of the first difference
-    std::vector<Fault> faults;       ///< in the order of computation, the first of them when they are very many
+    std::vector<Fault> faults;       ///< in the order of computation
     /// Whether the faults are those of values whose inputs the dump has. Else all that differ in the first stage that
     /// does are taken for faults.
     bool inputsAreKnown = true;

@@ -14,7 +14,20 @@ namespace {
 /// The part of the faults that a pattern has to explain: a fault may hide behind another.
 constexpr double enough = 0.9;
 
-/// A mistake, and where it is named.
+/// Of more faults than these, every nth is looked at.
+constexpr std::size_t mostExplained = 20000;
+
+std::vector<Fault> sample(const std::vector<Fault>& faults)
+{
+    const std::size_t each = (faults.size() + mostExplained - 1) / mostExplained;
+    std::vector<Fault> some;
+    for (std::size_t i = 0; i < faults.size(); i += each) {
+        some.push_back(faults[i]);
+    }
+    return some;
+}
+
+/// A mistake, and what it is called.
 struct NamedMistake {
     Mistake mistake;
     const char* text;
@@ -63,10 +76,11 @@ private:
     template <class Matches>
     static void consider(const std::string& text, const std::vector<Fault>& faults, Finding& finding, Matches matches)
     {
-        const auto count = static_cast<std::size_t>(std::count_if(faults.begin(), faults.end(), matches));
-        if (count > finding.explained && static_cast<double>(count) >= enough * static_cast<double>(faults.size())) {
+        const auto count = std::count_if(faults.begin(), faults.end(), matches);
+        const double part = static_cast<double>(count) / static_cast<double>(faults.size());
+        if (part > finding.explained && part >= enough) {
             finding.how = text;
-            finding.explained = count;
+            finding.explained = part;
         }
     }
 
@@ -288,7 +302,7 @@ std::vector<Finding> findPatterns(const Model& model, const Values& dump, const 
         finding.stage = stage;
         finding.faults = ofStage.size();
         finding.where = whereOf(model.windows, ofStage);
-        explainer.explain(ofStage, finding);
+        explainer.explain(sample(ofStage), finding);
         findings.push_back(finding);
     }
     return findings;

@@ -17,9 +17,9 @@ namespace morvik::comparison {
 struct Finding {
     Stage stage;
     std::size_t faults = 0;
-    std::string where;          ///< "at the starts of windows alone"
-    std::string how;            ///< the mistake by which the values are as they are; empty when none explains them
-    std::size_t explained = 0;  ///< faults that the mistake gives
+    std::string where;     ///< "at the starts of windows alone"
+    std::string how;       ///< the mistake by which the values are as they are; empty when none explains them
+    double explained = 0;  ///< the part of the faults that the mistake gives
 };
 
 /// A finding for each stage that has faults, in the order in which they appear first.

@@ -246,10 +246,10 @@ private:
             itsText += ":\n  ";
             if (finding.how.empty()) {
                 itsText += "no pattern that is known";
-            } else if (finding.explained == finding.faults) {
+            } else if (finding.explained >= 1) {
                 itsText += finding.how;
             } else {
-                itsText += finding.how + ", in " + std::to_string(finding.explained) + " of them";
+                itsText += finding.how + format(", in %.0f %% of them", 100 * finding.explained);
             }
             itsText += ".\n";
         }

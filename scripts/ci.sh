@@ -26,7 +26,7 @@ stage_lint() {
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp|bindings/octave/morvik_mex\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
-        --suppress=internalAstError -I include -I src -I . src link simulation report testbench trace vectors validation app
+        --suppress=internalAstError -I include -I src -I . src link simulation report testbench trace comparison vectors validation app
 }
 
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.

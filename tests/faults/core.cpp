@@ -12,15 +12,17 @@ namespace {
 
 using namespace morvik::comparison;
 
-/// A block of soft values as the command takes them.
+/// The first block of soft values, as the command takes them.
 morvik::SoftBlock readBlock(std::istream& input)
 {
     morvik::SoftBlock block;
     std::string line;
     std::getline(input, line);  // the header
     while (std::getline(input, line)) {
+        int label = 0;
         int values[3] = {};
-        if (std::sscanf(line.c_str(), "%*u,%d,%d,%d", &values[0], &values[1], &values[2]) != 3) {
+        const int read = std::sscanf(line.c_str(), "%d,%d,%d,%d", &label, &values[0], &values[1], &values[2]);
+        if (read != 4 || label != 0) {
             break;
         }
         block.rsc1Sys.push_back(values[0]);
