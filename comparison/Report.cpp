@@ -12,7 +12,8 @@ namespace morvik::comparison {
 
 namespace {
 
-constexpr unsigned contextSteps = 3;  // before and behind the first difference
+constexpr unsigned contextSteps = 3;     // before and behind the first difference
+constexpr std::size_t fewestFaults = 4;  // that show a pattern
 
 __attribute__((format(printf, 1, 2))) std::string format(const char* form, ...)
 {
@@ -251,7 +252,8 @@ private:
             } else {
                 itsText += finding.how + format(", in %.0f %% of them", 100 * finding.explained);
             }
-            itsText += ".\n";
+            const bool few = !finding.how.empty() && finding.faults < fewestFaults;
+            itsText += few ? "; with so few faults, this may be chance.\n" : ".\n";
         }
     }
 
