@@ -53,7 +53,7 @@ constexpr std::array<NamedMistake, 14> namedMistakes = {{
 
 class Explainer {
 public:
-    Explainer(const Model& model, const Values& dump) : itsModel(model), itsDump(dump), itsReplay(model, dump) {}
+    Explainer(const Model& model, const Values& dump) : itsModel(model), itsReplay(model, dump) {}
 
     /// Fills in how the faults came about.
     void explain(const std::vector<Fault>& faults, Finding& finding) const
@@ -151,7 +151,6 @@ private:
     }
 
     const Model& itsModel;
-    const Values& itsDump;
     Replay itsReplay;
 };
 
@@ -182,7 +181,7 @@ constexpr bool isBackward(const Place& place)
 }
 
 /// The narrow ones first.
-constexpr std::array<Kind, 8> kinds = {{
+constexpr std::array<Kind, 6> kinds = {{
     {"at the beginning of segment 0 alone",
      [](const Windows&, const Place& place) {
          return isForward(place) && place.step == 0;
@@ -207,14 +206,6 @@ constexpr std::array<Kind, 8> kinds = {{
      [](const Windows& windows, const Place& place) {
          return windows.segments > 1 && place.step < windows.segmentLength;
      }},
-    {"on the natural code alone",
-     [](const Windows&, const Place& place) {
-         return codeOf(place.pass) == 0;
-     }},
-    {"on the interleaved code alone",
-     [](const Windows&, const Place& place) {
-         return codeOf(place.pass) == 1;
-     }},
 }};
 
 /// What a property of all faults is, when it is one and the same.
@@ -232,7 +223,8 @@ void append(std::string& text, const std::string& part)
     text += (text.empty() ? "" : ", ") + part;
 }
 
-std::string whereOf(const Windows& windows, const std::vector<Fault>& faults)
+/// Faults that are but the differences of the first pass tell nothing of passes.
+std::string whereOf(const Windows& windows, const std::vector<Fault>& faults, bool ofAllPasses)
 {
     std::string text;
     if (faults.size() == 1) {
@@ -245,8 +237,12 @@ std::string whereOf(const Windows& windows, const std::vector<Fault>& faults)
     if (kind != kinds.end()) {
         append(text, kind->text);
     }
-    if (const auto pass = common(faults, [](const Place& place) { return place.pass; })) {
+    const auto pass = common(faults, [](const Place& place) { return place.pass; });
+    const auto code = common(faults, [](const Place& place) { return codeOf(place.pass); });
+    if (ofAllPasses && pass) {
         append(text, "in half-iteration " + std::to_string(*pass) + " alone");
+    } else if (ofAllPasses && code) {
+        append(text, *code == 0 ? "on the natural code alone" : "on the interleaved code alone");
     }
     const auto signal = common(faults, [](const Place& place) { return place.signal; });
     if (signal && signalsOf(stageOf(*signal)).count > 1) {
@@ -285,8 +281,9 @@ Agreement agreement(const Model& model, const Values& dump, unsigned passes, uns
 
 }  // namespace
 
-std::vector<Finding> findPatterns(const Model& model, const Values& dump, const std::vector<Fault>& faults)
+std::vector<Finding> findPatterns(const Model& model, const Values& dump, const Comparison& comparison)
 {
+    const std::vector<Fault>& faults = comparison.faults;
     const Explainer explainer(model, dump);
     std::vector<Finding> findings;
     for (const Fault& each : faults) {
@@ -301,7 +298,7 @@ std::vector<Finding> findPatterns(const Model& model, const Values& dump, const 
         Finding finding{};
         finding.stage = stage;
         finding.faults = ofStage.size();
-        finding.where = whereOf(model.windows, ofStage);
+        finding.where = whereOf(model.windows, ofStage, comparison.inputsAreKnown);
         explainer.explain(sample(ofStage), finding);
         findings.push_back(finding);
     }

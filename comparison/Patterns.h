@@ -23,7 +23,7 @@ struct Finding {
 };
 
 /// A finding for each stage that has faults, in the order in which they appear first.
-std::vector<Finding> findPatterns(const Model& model, const Values& dump, const std::vector<Fault>& faults);
+std::vector<Finding> findPatterns(const Model& model, const Values& dump, const Comparison& comparison);
 
 /// The dump counts passes or steps in another way: what to change, when most values fit then.
 std::optional<std::string> findShift(const Model& model, const Values& dump);

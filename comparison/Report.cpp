@@ -231,7 +231,8 @@ private:
         itsText +=
             itsComparison.inputsAreKnown
                 ? "Faults do not follow from the dump's own inputs of them; other differences are consequences.\n\n"
-                : "Faults cannot be told from consequences: the dump lacks the inputs.\n\n";
+                : "Faults cannot be told from consequences, as the dump lacks inputs: the first stage that differs is "
+                  "looked at.\n\n";
     }
 
     void addFindings()
@@ -240,9 +241,10 @@ private:
             itsText += "Found: " + *shift + ".\n";
             return;
         }
-        for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison.faults)) {
+        for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison)) {
             const std::string values = wordsOf(finding.stage).values;
-            itsText += "Found in " + values + ", " + counted(finding.faults, "fault");
+            itsText += "Found in " + values + ", " +
+                       counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
             itsText += finding.where.empty() ? "" : ", " + finding.where;
             itsText += ":\n  ";
             if (finding.how.empty()) {
@@ -253,7 +255,7 @@ private:
                 itsText += finding.how + format(", in %.0f %% of them", 100 * finding.explained);
             }
             const bool few = !finding.how.empty() && finding.faults < fewestFaults;
-            itsText += few ? "; with so few faults, this may be chance.\n" : ".\n";
+            itsText += few ? "; with so few, this may be chance.\n" : ".\n";
         }
     }
 
