@@ -110,10 +110,11 @@ private:
         constexpr std::size_t fewest = 8;  // with fewer, other bits may be alike by chance
         for (int bit = 0; faults.size() >= fewest && bit < 12; ++bit) {
             const std::string text = "bit " + std::to_string(bit) + " is stuck at ";
-            consider(text + '1', faults, finding, [bit](const Fault& fault) {
+            // A carry into a value that is always even looks the same.
+            consider(text + (bit == 0 ? "1, or rounding" : "1"), faults, finding, [bit](const Fault& fault) {
                 return fault.got == (fault.wanted | 1 << bit);
             });
-            consider(text + '0', faults, finding, [bit](const Fault& fault) {
+            consider(text + (bit == 0 ? "0, or rounding" : "0"), faults, finding, [bit](const Fault& fault) {
                 return fault.got == (fault.wanted & ~(1 << bit));
             });
         }

@@ -83,9 +83,9 @@ void takePending(trellis::PendingMetric<Value>& metric, const trellis::PendingMe
     metric.pending = from.pending;
 }
 
-bool startsSegment(const Windows& windows, unsigned place)
+bool startsSegment(const Windows& windows, unsigned trellisStep)
 {
-    return place < windows.K && place % windows.segmentLength == 0;
+    return trellisStep < windows.K && trellisStep % windows.segmentLength == 0;
 }
 
 template <class Words>
@@ -105,21 +105,21 @@ Replay::Replay(const Model& model, const Values& dump) : itsModel(model), itsDum
 {
 }
 
-Column Replay::column(unsigned pass, Stage stage, unsigned place, Mistake mistake) const
+Column Replay::column(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake) const
 {
     switch (stage) {
     case Stage::intrinsic:
-        return intrinsicColumn(pass, place, mistake);
+        return intrinsicColumn(pass, trellisStep, mistake);
     case Stage::branch:
-        return branchColumn(pass, place, mistake);
+        return branchColumn(pass, trellisStep, mistake);
     case Stage::forward:
-        return forwardColumn(pass, place, mistake);
+        return forwardColumn(pass, trellisStep, mistake);
     case Stage::backward:
-        return backwardColumn(pass, place, mistake);
+        return backwardColumn(pass, trellisStep, mistake);
     case Stage::ratio:
-        return ratioColumn(pass, place, mistake);
+        return ratioColumn(pass, trellisStep, mistake);
     default:
-        return extrinsicColumn(pass, place, mistake);
+        return extrinsicColumn(pass, trellisStep, mistake);
     }
 }
 
@@ -131,66 +131,66 @@ std::int16_t Replay::input(const Place& place, bool& complete) const
 }
 
 template <class Aligned>
-Aligned Replay::inputs(unsigned pass, Stage stage, unsigned place, bool& complete) const
+Aligned Replay::inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& complete) const
 {
     Aligned words{};
     for (unsigned i = 0; i < words.size(); ++i) {
-        words[i] = input({pass, signalsOf(stage).first + i, place}, complete);
+        words[i] = input({pass, signalsOf(stage).first + i, trellisStep}, complete);
     }
     return words;
 }
 
-int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned place, Mistake mistake, bool& complete) const
+int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const
 {
     const unsigned d = codeOf(pass);
     const Code& code = itsModel.codes[d];
-    const bool isTail = place >= itsModel.windows.K;
+    const bool isTail = trellisStep >= itsModel.windows.K;
     int apriori = 0;
     if (!isTail && pass > 0 && mistake != Mistake::aprioriMissing) {
-        const unsigned from = mistake == Mistake::aprioriUnpermuted ? place : code.order[place];
+        const unsigned from = mistake == Mistake::aprioriUnpermuted ? trellisStep : code.order[trellisStep];
         apriori = input({pass - 1, signalsOf(Stage::extrinsic).first, from}, complete);
     }
     const bool unpermuted = mistake == Mistake::systematicUnpermuted && !isTail;
-    const int systematic = (unpermuted ? itsModel.codes[1 - d] : code).systematic[place];
+    const int systematic = (unpermuted ? itsModel.codes[1 - d] : code).systematic[trellisStep];
     return ((apriori / 2) & stepMask) + systematic;  // rule 13, before the last division
 }
 
-int Replay::twiceIntrinsic(unsigned pass, unsigned place, bool& complete) const
+int Replay::twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const
 {
     // A dump lacks the bit below a step. Hardware whose intrinsic value has other reasons than the inputs may have
     // another one there than follows from them: then what is computed with it tells.
-    const int kept = input({pass, signalsOf(Stage::intrinsic).first, place}, complete);
+    const int kept = input({pass, signalsOf(Stage::intrinsic).first, trellisStep}, complete);
     bool ignored = true;
-    const int computed = twiceIntrinsicFromInputs(pass, place, Mistake::none, ignored);
+    const int computed = twiceIntrinsicFromInputs(pass, trellisStep, Mistake::none, ignored);
     const int likely = ((computed / 2) & stepMask) == kept ? computed : 2 * kept;
     const int other = likely ^ step;
-    return !givesWhatFollows(pass, place, likely) && givesWhatFollows(pass, place, other) ? other : likely;
+    return !givesWhatFollows(pass, trellisStep, likely) && givesWhatFollows(pass, trellisStep, other) ? other : likely;
 }
 
-bool Replay::givesWhatFollows(unsigned pass, unsigned place, int twice) const
+bool Replay::givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const
 {
-    if (place >= itsModel.windows.K) {
+    if (trellisStep >= itsModel.windows.K) {
         return true;
     }
     bool complete = true;
-    const auto branches = inputs<Branches>(pass, Stage::branch, place, complete);
-    const int ratio = input({pass, signalsOf(Stage::ratio).first, place}, complete);
-    const int extrinsic = input({pass, signalsOf(Stage::extrinsic).first, place}, complete);
-    return complete && branchMetrics(pass, place, twice, Mistake::none) == branches &&
+    const auto branches = inputs<Branches>(pass, Stage::branch, trellisStep, complete);
+    const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
+    const int extrinsic = input({pass, signalsOf(Stage::extrinsic).first, trellisStep}, complete);
+    return complete && branchMetrics(pass, trellisStep, twice, Mistake::none) == branches &&
            extrinsicValue(ratio, twice, Mistake::none) == extrinsic;
 }
 
-Column Replay::intrinsicColumn(unsigned pass, unsigned place, Mistake mistake) const
+Column Replay::intrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const int twice = twiceIntrinsicFromInputs(pass, place, mistake, complete);
+    const int twice = twiceIntrinsicFromInputs(pass, trellisStep, mistake, complete);
     return inSteps(std::array<int, 1>{twice / 2}, complete);
 }
 
-Replay::Branches Replay::branchMetrics(unsigned pass, unsigned place, int twice, Mistake mistake) const
+Replay::Branches Replay::branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const
 {
     const unsigned d = codeOf(pass);
-    int parity = itsModel.codes[mistake == Mistake::parityOfOtherCode ? 1 - d : d].parity[place];
+    int parity = itsModel.codes[mistake == Mistake::parityOfOtherCode ? 1 - d : d].parity[trellisStep];
     if (mistake == Mistake::parityNegated) {
         parity = -parity;
     }
@@ -202,11 +202,11 @@ Replay::Branches Replay::branchMetrics(unsigned pass, unsigned place, int twice,
     return metrics;
 }
 
-Column Replay::branchColumn(unsigned pass, unsigned place, Mistake mistake) const
+Column Replay::branchColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const int twice = twiceIntrinsic(pass, place, complete);
-    return inSteps(branchMetrics(pass, place, twice, mistake), complete);
+    const int twice = twiceIntrinsic(pass, trellisStep, complete);
+    return inSteps(branchMetrics(pass, trellisStep, twice, mistake), complete);
 }
 
 Replay::Metrics Replay::reached(
@@ -224,7 +224,7 @@ Replay::Metrics Replay::reached(
         earlierMetrics = inputs<Metrics>(pass, stage, earlier, complete);
         earlierBranches = inputs<Branches>(pass, Stage::branch, earlier, complete);
     }
-    const auto step = [&](const auto& rule, auto kind) {
+    const auto advance = [&](const auto& rule, auto kind) {
         using Value = decltype(kind);
         auto column = settledColumn(rule, fromWords<Value>(metrics));
         if (hasEarlier) {
@@ -243,7 +243,7 @@ Replay::Metrics Replay::reached(
         }
         return words;
     };
-    return withRule(algorithm, mistake, itsCorrections.data() + itsCorrections.size() / 2, step);
+    return withRule(algorithm, mistake, itsCorrections.data() + itsCorrections.size() / 2, advance);
 }
 
 namespace {
@@ -276,16 +276,16 @@ Replay::Metrics Replay::forwardStart(unsigned pass, unsigned segment, Mistake mi
     return border(reached(pass - 2, Stage::forward, segment * length - 1, length > 1, mistake, complete), mistake);
 }
 
-Column Replay::forwardColumn(unsigned pass, unsigned place, Mistake mistake) const
+Column Replay::forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
     const Windows& windows = itsModel.windows;
-    if (startsSegment(windows, place)) {
-        const Metrics start = forwardStart(pass, place / windows.segmentLength, mistake, complete);
+    if (startsSegment(windows, trellisStep)) {
+        const Metrics start = forwardStart(pass, trellisStep / windows.segmentLength, mistake, complete);
         return inSteps(start, complete);
     }
-    const bool hasEarlier = !startsSegment(windows, place - 1);
-    const Metrics next = reached(pass, Stage::forward, place - 1, hasEarlier, mistake, complete);
+    const bool hasEarlier = !startsSegment(windows, trellisStep - 1);
+    const Metrics next = reached(pass, Stage::forward, trellisStep - 1, hasEarlier, mistake, complete);
     return inSteps(next, complete);
 }
 
@@ -322,24 +322,25 @@ Replay::Metrics Replay::backwardStart(unsigned pass, const Window& window, Mista
     return border(reached(ofThisPass ? pass : pass - 2, Stage::backward, from, hasEarlier, mistake, complete), mistake);
 }
 
-Column Replay::backwardColumn(unsigned pass, unsigned place, Mistake mistake) const
+Column Replay::backwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const Window& window = itsModel.windows.at(place);
-    if (place == window.last) {
+    const Window& window = itsModel.windows.at(trellisStep);
+    if (trellisStep == window.last) {
         const Metrics start = backwardStart(pass, window, mistake, complete);
         return inSteps(start, complete);
     }
-    const Metrics next = reached(pass, Stage::backward, place + 1, place + 1 < window.last, mistake, complete);
+    const Metrics next =
+        reached(pass, Stage::backward, trellisStep + 1, trellisStep + 1 < window.last, mistake, complete);
     return inSteps(next, complete);
 }
 
-Column Replay::ratioColumn(unsigned pass, unsigned place, Mistake mistake) const
+Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const auto a = inputs<Metrics>(pass, Stage::forward, place, complete);
-    const auto b = inputs<Metrics>(pass, Stage::backward, place, complete);
-    const auto g = inputs<Branches>(pass, Stage::branch, place, complete);
+    const auto a = inputs<Metrics>(pass, Stage::forward, trellisStep, complete);
+    const auto b = inputs<Metrics>(pass, Stage::backward, trellisStep, complete);
+    const auto g = inputs<Branches>(pass, Stage::branch, trellisStep, complete);
     const auto ratio = [&](const auto& rule, auto kind) {
         using Value = decltype(kind);
         return wordOf(trellis::logLikelihoodRatio(rule, fromWords<Value>(a), fromWords<Value>(b), fromWords<Value>(g)));
@@ -358,11 +359,11 @@ int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const
     return narrowed(value, mistake) & stepMask;
 }
 
-Column Replay::extrinsicColumn(unsigned pass, unsigned place, Mistake mistake) const
+Column Replay::extrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const int ratio = input({pass, signalsOf(Stage::ratio).first, place}, complete);
-    const int twice = twiceIntrinsic(pass, place, complete);
+    const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
+    const int twice = twiceIntrinsic(pass, trellisStep, complete);
     return inSteps(std::array<int, 1>{extrinsicValue(ratio, twice, mistake)}, complete);
 }
 

@@ -44,7 +44,7 @@ public:
     Replay(const Model& model, const Values& dump);
 
     /// All signals of a stage at a trellis step.
-    Column column(unsigned pass, Stage stage, unsigned step, Mistake mistake = Mistake::none) const;
+    Column column(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake = Mistake::none) const;
 
 private:
     using Metrics = std::array<std::int16_t, 8>;  // aligned words
@@ -52,13 +52,13 @@ private:
 
     std::int16_t input(const Place& place, bool& complete) const;
     template <class Aligned>
-    Aligned inputs(unsigned pass, Stage stage, unsigned step, bool& complete) const;
+    Aligned inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& complete) const;
 
-    int twiceIntrinsicFromInputs(unsigned pass, unsigned step, Mistake mistake, bool& complete) const;
-    int twiceIntrinsic(unsigned pass, unsigned step, bool& complete) const;
-    bool givesWhatFollows(unsigned pass, unsigned step, int twice) const;
+    int twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const;
+    int twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const;
+    bool givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const;
     int extrinsicValue(int ratio, int twice, Mistake mistake) const;
-    Branches branchMetrics(unsigned pass, unsigned step, int twice, Mistake mistake) const;
+    Branches branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const;
     /// The column to which a recursion comes from the step `from`. `hasEarlier` tells whether it came there from
     /// another step, whose decisions may have left corrections pending.
     Metrics reached(unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, bool& complete) const;
@@ -66,12 +66,12 @@ private:
     Metrics backwardStart(unsigned pass, const Window& window, Mistake mistake, bool& complete) const;
     Metrics tail(unsigned pass) const;
 
-    Column intrinsicColumn(unsigned pass, unsigned step, Mistake mistake) const;
-    Column branchColumn(unsigned pass, unsigned step, Mistake mistake) const;
-    Column forwardColumn(unsigned pass, unsigned step, Mistake mistake) const;
-    Column backwardColumn(unsigned pass, unsigned step, Mistake mistake) const;
-    Column ratioColumn(unsigned pass, unsigned step, Mistake mistake) const;
-    Column extrinsicColumn(unsigned pass, unsigned step, Mistake mistake) const;
+    Column intrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column branchColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column backwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column extrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
 
     const Model& itsModel;
     const Values& itsDump;
