@@ -60,7 +60,7 @@ StageWords wordsOf(Stage stage)
     }
 }
 
-const char* shortName(Stage stage)
+std::string shortName(Stage stage)
 {
     constexpr std::array<const char*, 6> names = {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"};
     return names[static_cast<std::size_t>(stage)];
@@ -166,7 +166,7 @@ private:
             const unsigned all = signalsOf(input.stage).count;
             const std::string part = input.present > 0 && input.present < all ? ", as far as it is in the dump" : "";
             itsText += format("  input %-10s of half-iteration %u, step %u: %s%s\n",
-                              shortName(input.stage),
+                              shortName(input.stage).c_str(),
                               input.pass,
                               input.step,
                               state,

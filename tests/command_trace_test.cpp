@@ -1,4 +1,5 @@
 // The command morvik trace: its formats against the library's own trace and each other, and what it refuses.
+#include <stdlib.h>
 #include <sys/resource.h>
 
 #include <algorithm>
@@ -232,6 +233,7 @@ TEST_F(CommandTrace, KeepsWarningsOutOfTables)
 /// Whatever the length of the trace: what thirty passes add to one would be 20 MB at least.
 TEST_F(CommandTrace, NeedsNoMoreMemoryForMorePasses)
 {
+    setenv("ASAN_OPTIONS", "quarantine_size_mb=1", 0);  // the address sanitizer keeps freed memory
     for (const std::string format : {"text", "csv", "npy", "vcd"}) {
         const std::vector<std::string> arguments = {
             vectors("k6144.csv"), "--iterations", "15", "--format", format, "--output", "trace"};
