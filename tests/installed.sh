@@ -19,8 +19,8 @@ if grep -rlF -e "$folder" -e "$build" -e "$source" "$prefix"; then
 fi
 
 [ "$("$prefix/bin/morvik" --version)" = "$("$build/bin/morvik" --version)" ] || fail "The command does not start"
-ldd "$prefix/bin/morvik" | grep -qF "$prefix/bin/../lib/libmorvik_v1_0_bitacc_cmodel.so.1" ||
-    fail "The command uses another library"
+libraries=$(ldd "$prefix/bin/morvik")
+[[ "$libraries" == *"$prefix/bin/../lib/libmorvik_v1_0_bitacc_cmodel.so.1"* ]] || fail "The command uses another library"
 
 echo "As a CMake project"
 "$cmake" -S "$source/examples" -B "$folder/cmake" -DCMAKE_PREFIX_PATH="$prefix" >/dev/null
