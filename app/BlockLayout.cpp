@@ -13,32 +13,26 @@ namespace morvik {
 
 namespace {
 
-constexpr unsigned tailSteps = 3;
-
-Division divisionOf(std::uint32_t K, int numPu)
+UnitLayout divided(std::uint32_t K, int numPu)
 {
     const std::unique_ptr<TDecoder> made(TDecoder::create("3GPPPU:" + std::to_string(numPu)));
     auto* const decoder = dynamic_cast<TDecoder3GPU*>(made.get());
     if (decoder == nullptr || !decoder->allocate(K + tailSteps)) {
         throw std::runtime_error("the decoder does not divide blocks of " + std::to_string(K) + " bits");
     }
-    Division division;
-    division.numPu = numPu;
-    division.threads = decoder->itsNumPU * decoder->itsThreadsPerPU;
-    division.segments = decoder->itsNT;
-    division.segmentLength = K / decoder->itsNT;
-    for (const TDecoder3GPU::ABSegment& each : decoder->itsBetaSegment) {
-        Window window;
-        window.row = static_cast<unsigned>(division.windows.size()) / division.segments;
-        window.segment = each.from / division.segmentLength;
-        window.last = each.from;
-        window.first = division.windows.empty() ? 0 : each.to + 1;  // the block's first window ends at its own step 0
+    const Division division(*decoder);
+    UnitLayout layout;
+    layout.numPu = numPu;
+    layout.threads = decoder->itsNumPU * decoder->itsThreadsPerPU;
+    layout.segments = division.segments();
+    layout.segmentLength = division.segmentLength();
+    layout.windows = division.windows();
+    for (const Window& window : layout.windows) {
         if (window.segment == 0) {
-            division.lengths.push_back(window.last - window.first + 1);
+            layout.lengths.push_back(window.last - window.first + 1);
         }
-        division.windows.push_back(window);
     }
-    return division;
+    return layout;
 }
 
 NumberFormat formatOf(const std::string& what, const std::string& text)
@@ -67,7 +61,7 @@ BlockLayout layoutOf(std::uint32_t K)
     const std::unique_ptr<TInterleaver> interleaver(TInterleaver::create("3GPPLTE"));
     interleaver->calcInterleaver(layout.interleaver, K);
     for (const int numPu : {2, 4, 8}) {
-        layout.divisions.push_back(divisionOf(K, numPu));
+        layout.divisions.push_back(divided(K, numPu));
     }
     return layout;
 }

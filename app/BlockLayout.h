@@ -6,18 +6,12 @@
 #include <string>
 #include <vector>
 
+#include "testbench/Division.h"
+
 namespace morvik {
 
-/// A window of the backward recursion, which runs from its last step down to its first.
-struct Window {
-    unsigned row = 0;
-    unsigned segment = 0;
-    std::uint32_t first = 0;  ///< trellis step
-    std::uint32_t last = 0;
-};
-
 /// How a number of processing units divides a block.
-struct Division {
+struct UnitLayout {
     int numPu = 0;
     unsigned threads = 0;
     unsigned segments = 0;
@@ -31,7 +25,7 @@ struct BlockLayout {
     std::uint32_t f1 = 0;
     std::uint32_t f2 = 0;
     std::vector<unsigned> interleaver;  ///< entry i is the bit that the second encoder takes as its i-th one
-    std::vector<Division> divisions;    ///< for 2, 4 and 8 units
+    std::vector<UnitLayout> divisions;  ///< for 2, 4 and 8 units
 };
 
 /// Of a block size; throws std::invalid_argument for another K.

@@ -29,7 +29,7 @@ struct Options {
     std::string plot;
 };
 
-std::string lengthsText(const Division& division)
+std::string lengthsText(const UnitLayout& division)
 {
     std::string text;
     for (std::size_t row = 0; row < division.lengths.size();) {
@@ -52,7 +52,7 @@ std::string textOf(const BlockLayout& layout)
                        ", f2 = " + std::to_string(layout.f2) + "; the second encoder's bit i is bit (" +
                        std::to_string(layout.f1) + " i + " + std::to_string(layout.f2) + " i^2) mod " + K +
                        "\n\nunits  threads  segments  steps of each  rows  steps of the windows\n";
-    for (const Division& division : layout.divisions) {
+    for (const UnitLayout& division : layout.divisions) {
         char line[80];
         std::snprintf(line,
                       sizeof line,
@@ -116,7 +116,7 @@ std::string tableText(const BlockLayout& layout)
 
 using Json = nlohmann::ordered_json;
 
-Json jsonOf(const Division& division)
+Json jsonOf(const UnitLayout& division)
 {
     Json windows = Json::array();
     for (const Window& window : division.windows) {
@@ -154,7 +154,7 @@ Json jsonOf(const BlockLayout& layout, bool table)
                    {"soft_value_rows", layout.K + 4},
                    {"trellis_steps", layout.K + 3},
                    {"divisions", Json::array()}};
-    for (const Division& division : layout.divisions) {
+    for (const UnitLayout& division : layout.divisions) {
         object["divisions"].push_back(jsonOf(division));
     }
     if (table) {

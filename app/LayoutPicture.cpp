@@ -27,7 +27,7 @@ constexpr const char* backwardInk = "#b5541c";
 /// Unit counts that divide a block alike.
 struct Panel {
     std::string units;
-    const Division* division;
+    const UnitLayout* division;
 
     double height() const
     {
@@ -38,7 +38,7 @@ struct Panel {
 std::vector<Panel> panelsOf(const BlockLayout& layout)
 {
     std::vector<Panel> panels;
-    for (const Division& division : layout.divisions) {
+    for (const UnitLayout& division : layout.divisions) {
         const std::string units = std::to_string(division.numPu);
         if (!panels.empty() && panels.back().division->segments == division.segments) {
             panels.back().units += ", " + units;
@@ -72,7 +72,7 @@ std::string shadeOf(std::size_t row, std::size_t rows)
 /// One panel, whose segments begin at the height `top`.
 class Painter {
 public:
-    Painter(const Division& division, double top, Drawing& drawing)
+    Painter(const UnitLayout& division, double top, Drawing& drawing)
         : itsDivision(division), itsTop(top), itsDrawing(drawing)
     {
     }
@@ -142,14 +142,14 @@ private:
         }
     }
 
-    const Division& itsDivision;
+    const UnitLayout& itsDivision;
     double itsTop;
     Drawing& itsDrawing;
 };
 
 std::string headingOf(const Panel& panel)
 {
-    const Division& division = *panel.division;
+    const UnitLayout& division = *panel.division;
     std::string units = panel.units;
     const std::size_t last = units.rfind(", ");
     if (last != std::string::npos) {

@@ -3,30 +3,27 @@
 
 #include <cstddef>
 #include <sstream>
+#include <utility>
 
 #include "src/TDecoder3GPU.h"
-#include "testbench/Passes.h"
 
 namespace morvik::comparison {
 
 namespace {
 
-Windows windowsOf(const TDecoder3GPU& decoder, const Division& division)
+Windows windowsOf(const Division& division)
 {
     Windows windows;
     windows.K = division.K();
     windows.segments = division.segments();
     windows.segmentLength = division.segmentLength();
-    windows.rows = static_cast<unsigned>(decoder.itsBetaSegment.size()) / windows.segments;
+    windows.inOrder = division.windows();
+    windows.rows = static_cast<unsigned>(windows.inOrder.size()) / windows.segments;
     windows.ofStep.resize(windows.K);
-    for (const TDecoder3GPU::ABSegment& each : decoder.itsBetaSegment) {
-        const auto number = static_cast<unsigned>(windows.inOrder.size());
-        // The block's first window ends at its own first step, the others before theirs.
-        const Window window = {number / windows.segments, number == 0 ? 0 : each.to + 1, each.from};
-        for (unsigned step = window.first; step <= window.last; ++step) {
+    for (unsigned number = 0; number < windows.inOrder.size(); ++number) {
+        for (unsigned step = windows.inOrder[number].first; step <= windows.inOrder[number].last; ++step) {
             windows.ofStep[step] = number;
         }
-        windows.inOrder.push_back(window);
     }
     return windows;
 }
@@ -55,9 +52,9 @@ Model computeModel(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics&
     }
     const TDecoder3GPU& core = passes.component();
     return {generics,
-            values,
+            std::move(values),
             passes.division(),
-            windowsOf(core, passes.division()),
+            windowsOf(passes.division()),
             {{{core.itsSys[0], core.itsPar0[0], core.itsInterleaver->itsPiInv},
               {core.itsSys[1], core.itsPar0[1], core.itsInterleaver->itsPi}}}};
 }

@@ -8,16 +8,10 @@
 
 #include "Values.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
+#include "testbench/Passes.h"
 #include "testbench/SoftBlock.h"
 
 namespace morvik::comparison {
-
-/// A window of the backward recursion: trellis steps.
-struct Window {
-    unsigned row;  ///< which window of its segment
-    unsigned first;
-    unsigned last;
-};
 
 /// The segments and windows of a block (docs/arithmetic.md, rules 17 and 18).
 struct Windows {
@@ -25,7 +19,7 @@ struct Windows {
     unsigned segments = 0;
     unsigned segmentLength = 0;
     unsigned rows = 0;
-    std::vector<Window> inOrder;   ///< in the order in which they are computed, one of each segment, row by row
+    std::vector<Window> inOrder;   ///< those of the division
     std::vector<unsigned> ofStep;  ///< the window of each of the K steps
 
     const Window& at(unsigned step) const
@@ -48,10 +42,10 @@ struct Code {
     std::vector<unsigned> order;  ///< entry j is the place in the other code's order of what step j works on
 };
 
-/// The constituent code of a half-iteration (rule 15).
+/// Which of the two codes a half-iteration decodes.
 constexpr unsigned codeOf(unsigned pass)
 {
-    return pass % 2 == 0 ? 1 : 0;
+    return constituentCode(pass) - 1;
 }
 
 struct Model {

@@ -2,6 +2,7 @@
 #include "Division.h"
 
 #include <algorithm>
+#include <cstddef>
 
 #include "src/TDecoder3GPU.h"
 
@@ -12,8 +13,13 @@ Division::Division(const TDecoder3GPU& decoder)
       itsSegmentLength(decoder.itsAlphaSegment.front().to),
       itsSegmentsPerUnit(std::max(decoder.itsNT / decoder.itsNumPU, 1U))
 {
-    for (std::size_t window = 0; window < decoder.itsBetaSegment.size(); window += itsSegments) {
-        itsWindowEnds.push_back(decoder.itsBetaSegment[window].from);
+    for (const TDecoder3GPU::ABSegment& each : decoder.itsBetaSegment) {
+        Window window;
+        window.row = static_cast<std::uint32_t>(itsWindows.size()) / itsSegments;
+        window.segment = each.from / itsSegmentLength;
+        window.first = itsWindows.empty() ? 0 : each.to + 1;  // the block's first window ends at its own step 0
+        window.last = each.from;
+        itsWindows.push_back(window);
     }
 }
 
@@ -32,6 +38,11 @@ std::uint32_t Division::segmentLength() const
     return itsSegmentLength;
 }
 
+const std::vector<Window>& Division::windows() const
+{
+    return itsWindows;
+}
+
 std::uint32_t Division::units() const
 {
     return itsSegments / itsSegmentsPerUnit;
@@ -40,10 +51,11 @@ std::uint32_t Division::units() const
 StepPlace Division::placeOf(std::uint32_t step) const
 {
     const std::uint32_t within = std::min(step, K() - 1);
-    const auto end = std::lower_bound(itsWindowEnds.begin(), itsWindowEnds.end(), within % itsSegmentLength);
     StepPlace place;
     place.segment = within / itsSegmentLength;
-    place.window = static_cast<std::uint32_t>(end - itsWindowEnds.begin());
+    while (itsWindows[std::size_t{place.window} * itsSegments].last < within % itsSegmentLength) {
+        ++place.window;
+    }
     place.unit = place.segment / itsSegmentsPerUnit;
     place.thread = place.segment % itsSegmentsPerUnit;
     return place;

@@ -12,6 +12,14 @@ namespace morvik {
 /// Trellis steps of the termination tail.
 constexpr std::uint32_t tailSteps = 3;
 
+/// A window of the backward recursion, which runs from its last step down to its first.
+struct Window {
+    std::uint32_t row = 0;  ///< which window of its segment, from the segment's start
+    std::uint32_t segment = 0;
+    std::uint32_t first = 0;  ///< trellis step
+    std::uint32_t last = 0;
+};
+
 /// Where a trellis step is computed.
 struct StepPlace {
     std::uint32_t segment = 0;
@@ -31,6 +39,9 @@ public:
     std::uint32_t segments() const;
     std::uint32_t segmentLength() const;
 
+    /// In the order in which they are computed: one of each segment, row by row.
+    const std::vector<Window>& windows() const;
+
     /// Units that have a segment.
     std::uint32_t units() const;
 
@@ -41,7 +52,7 @@ private:
     std::uint32_t itsSegments;
     std::uint32_t itsSegmentLength;
     std::uint32_t itsSegmentsPerUnit;
-    std::vector<std::uint32_t> itsWindowEnds;  // the last step of each window of segment 0
+    std::vector<Window> itsWindows;
 };
 
 }  // namespace morvik

@@ -12,9 +12,9 @@ namespace {
 using namespace morvik;
 using Lengths = std::vector<std::uint32_t>;
 
-const Division& with(const BlockLayout& layout, int numPu)
+const UnitLayout& with(const BlockLayout& layout, int numPu)
 {
-    for (const Division& division : layout.divisions) {
+    for (const UnitLayout& division : layout.divisions) {
         if (division.numPu == numPu) {
             return division;
         }
@@ -27,7 +27,7 @@ TEST(BlockLayout, HasTheExampleOfTheDocuments)
     const BlockLayout layout = layoutOf(1280);
     EXPECT_EQ(layout.f1, 199U);
     EXPECT_EQ(layout.f2, 240U);
-    const Division& two = with(layout, 2);
+    const UnitLayout& two = with(layout, 2);
     EXPECT_EQ(two.threads, 8U);
     EXPECT_EQ(two.segments, 8U);
     EXPECT_EQ(two.segmentLength, 160U);
@@ -60,7 +60,7 @@ TEST(BlockLayout, HasTheSmallestAndTheLargestBlock)
 TEST(BlockLayout, WindowsCoverEachStepOnceRowByRow)
 {
     for (const standard::BlockSize& size : standard::blockSizes) {
-        for (const Division& division : layoutOf(size.K).divisions) {
+        for (const UnitLayout& division : layoutOf(size.K).divisions) {
             std::vector<unsigned> covered(size.K);
             ASSERT_EQ(division.windows.size(), division.segments * division.lengths.size());
             for (std::size_t i = 0; i < division.windows.size(); ++i) {
