@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Runs at a desk what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
-# Stages: format lint compilers abi memory threads fuzz coverage tests, and only when they are named:
+# Stages: format lint lint-tests compilers abi memory threads fuzz coverage tests, and only when they are named:
 # abi-renew mutate
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -15,6 +15,17 @@ stage_format() {
 }
 
 stage_lint() {
+    tidy {src,lanes,link,simulation,report,testbench,trace,comparison,vectors,validation,app,bindings}/'*.cpp'
+    cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
+        --suppress=internalAstError -I include -I src -I . src link simulation report testbench trace comparison vectors validation app
+}
+
+# Takes as long again as the rest.
+stage_lint-tests() {
+    tidy {tests,bench}/'*.cpp'
+}
+
+tidy() {
     scripts/build x86_64
     # On the standard error stream it counts what it suppresses, and says why it could not run.
     local log=build/x86_64/lint.log
@@ -22,11 +33,9 @@ stage_lint() {
     mkdir -p build/lint
     sed 's/ -fno-tree-[a-z]*//g' build/x86_64/compile_commands.json >build/lint/compile_commands.json
     # Two units of bench/ need packages that are not set up here, and Octave's own compiler builds its function.
-    git ls-files {src,lanes,link,simulation,report,testbench,trace,comparison,vectors,validation,app,bindings,tests,bench}/'*.cpp' |
+    git ls-files "$@" |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp|bindings/octave/morvik_mex\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
-    cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
-        --suppress=internalAstError -I include -I src -I . src link simulation report testbench trace comparison vectors validation app
 }
 
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.
@@ -122,10 +131,10 @@ stage_tests() {
 }
 
 scripts/setup --checks --tests
-[ $# -gt 0 ] || set -- format lint compilers abi memory threads fuzz coverage tests
+[ $# -gt 0 ] || set -- format lint lint-tests compilers abi memory threads fuzz coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint compilers abi memory threads fuzz coverage tests abi-renew mutate" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests compilers abi memory threads fuzz coverage tests abi-renew mutate" >&2
         exit 2
     fi
     echo "== $stage"
