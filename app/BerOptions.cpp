@@ -1,6 +1,7 @@
 // BerOptions: the arguments of `morvik ber`.
 #include "BerOptions.h"
 
+#include <algorithm>
 #include <array>
 #include <charconv>
 #include <functional>
@@ -299,6 +300,24 @@ std::string listed(const Values& values, Text textOf)
     return list;
 }
 
+/// A list of ascending values, three and more with equal steps as a range.
+std::string rangesText(const std::vector<int>& values)
+{
+    std::string list;
+    for (std::size_t first = 0; first < values.size();) {
+        std::size_t last = std::min(first + 1, values.size() - 1);
+        const int step = values[last] - values[first];
+        while (last + 1 < values.size() && values[last + 1] - values[last] == step) {
+            ++last;
+        }
+        const bool isRange = last > first + 1;
+        list += (list.empty() ? "" : ",") + thousandthsText(values[first]);
+        list += isRange ? ':' + thousandthsText(step) + ':' + thousandthsText(values[last]) : "";
+        first = isRange ? last + 1 : first + 1;
+    }
+    return list;
+}
+
 /// Holds whatever the results follow from, and nothing else.
 std::string commandOf(const BerOptions& options, const simulation::StopRules& rules)
 {
@@ -316,7 +335,7 @@ std::string commandOf(const BerOptions& options, const simulation::StopRules& ru
     add("--scale", listed(sweep.scaleOptions, simulation::scaleOptionText));
     add("--iterations", listed(sweep.iterations, number));
     if (!sweep.milliDecibels.empty()) {
-        add("--ebn0", listed(sweep.milliDecibels, thousandthsText));
+        add("--ebn0", rangesText(sweep.milliDecibels));
     }
     const auto addCount = [&](const std::string& option, const std::optional<std::uint64_t>& count) {
         if (count) {

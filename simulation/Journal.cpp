@@ -123,16 +123,21 @@ void Journal::resume(const std::string& checkpointFile)
                     itsPlan.version);
     }
     if (checkpoint->command != itsPlan.command) {
-        throw Error(checkpointFile + ": holds a run with other parameters: " + checkpoint->command);
+        throw Error(checkpointFile +
+                    ": holds a run with other parameters: " + differenceOf(checkpoint->command, itsPlan.command));
     }
     itsCheckpoint = *checkpoint;
 }
 
 void Journal::takeComplete()
 {
-    const auto points = pointsOfComplete(itsPlan, readResults(itsOutput));
+    const Results results = readResults(itsOutput);
+    const auto points = pointsOfComplete(itsPlan, results);
     if (!points) {
-        throw Error(itsOutput + ": holds other results, and there is no checkpoint to resume; --overwrite starts anew");
+        const std::string difference =
+            results.command.empty() ? "" : differenceOf(results.command, itsPlan.command);  // CSV does not tell
+        throw Error(itsOutput + ": holds other results" + (difference.empty() ? "" : " (" + difference + ')') +
+                    ", and there is no checkpoint to resume; --overwrite starts anew");
     }
     itsCheckpoint.ended = *points;
 }

@@ -3,6 +3,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <map>
+#include <sstream>
 
 #include "link/DefaultScale.h"
 
@@ -50,6 +52,23 @@ void appendRows(const Plan& plan, const PointResult& result, std::vector<ResultR
     }
 }
 
+/// The options of a command, with their values, if they have some.
+std::map<std::string, std::string> optionsOf(const std::string& command)
+{
+    std::map<std::string, std::string> options;
+    std::istringstream words(command);
+    std::string option;
+    for (std::string word; words >> word;) {
+        if (word.substr(0, 2) == "--") {
+            option = word;
+            options[option];
+        } else if (!option.empty()) {
+            options[option] = word;
+        }
+    }
+    return options;
+}
+
 }  // namespace
 
 std::vector<int> usualMilliDecibels(unsigned K)
@@ -80,6 +99,30 @@ std::vector<Point> pointsOf(const Sweep& sweep)
     }
     std::sort(points.begin(), points.end());
     return points;
+}
+
+std::string differenceOf(const std::string& command, const std::string& other)
+{
+    const auto ours = optionsOf(command);
+    const auto theirs = optionsOf(other);
+    std::string text;
+    const auto append = [&text](const std::string& part) {
+        text += (text.empty() ? "" : ", ") + part;
+    };
+    for (const auto& [option, value] : ours) {
+        const auto found = theirs.find(option);
+        if (found == theirs.end()) {
+            append(option + (value.empty() ? "" : " ") + value);
+        } else if (found->second != value) {
+            append(option + ' ' + value + " instead of " + found->second);
+        }
+    }
+    for (const auto& [option, value] : theirs) {
+        if (ours.count(option) == 0) {
+            append("without " + option);
+        }
+    }
+    return text;
 }
 
 bool isCurveEnded(const Plan& plan, std::size_t point, const std::vector<PointResult>& earlier)

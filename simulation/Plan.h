@@ -48,6 +48,10 @@ struct Plan {
     }
 };
 
+/// Which options of one command are not those of the other, both as plans have them: "--seed 1 instead of 2, without
+/// --each-iteration".
+std::string differenceOf(const std::string& command, const std::string& other);
+
 /// What has been counted at a point of a plan.
 struct PointResult {
     std::size_t number = 0;

@@ -174,7 +174,7 @@ TEST_F(JournalFiles, OfOtherParametersAreRefused)
         journal.begin();
     }
     plan.command = "morvik ber --seed 2";
-    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run with other parameters: morvik ber --seed 1");
+    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run with other parameters: --seed 1 instead of 2");
     plan.command = "morvik ber --seed 1";
     plan.version = "1.2.4";
     EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run of version 1.2.3, this is 1.2.4");
@@ -243,6 +243,23 @@ TEST_F(JournalFiles, CanBeOverwrittenBeforeTheyAreFinished)
     EXPECT_TRUE(journal.isEmpty());
     journal.begin();
     EXPECT_EQ(journal.resultSoFar(1).tally.blocks, 0U);
+}
+
+TEST_F(JournalFiles, OfOtherResultsTellWhatIsOtherIfTheyKnow)
+{
+    const std::string json = folder.path("results.json");
+    plan.rules.maxBlocks = 20;
+    writeResults(json, resultsOf(plan, {resultOf(0, 20), resultOf(1, 19)}));
+    plan.command = "morvik ber --seed 2";
+    try {
+        const Journal journal(plan, json, Earlier::resume);
+        ADD_FAILURE() << "not refused";
+    } catch (const Error& error) {
+        EXPECT_EQ(error.what(),
+                  json +
+                      ": holds other results (--seed 1 instead of 2), and there is no checkpoint to resume; "
+                      "--overwrite starts anew");
+    }
 }
 
 }  // namespace

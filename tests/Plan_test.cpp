@@ -166,4 +166,13 @@ TEST(Plan, MakesRowsAfterEachIterationInTheOrderOfASweepOverThem)
     }
 }
 
+TEST(Plan, NamesTheOptionsThatDiffer)
+{
+    EXPECT_EQ(differenceOf("morvik ber --seed 1 --num-pu 4", "morvik ber --seed 1 --num-pu 4"), "");
+    EXPECT_EQ(differenceOf("morvik ber --ebn0 -1:0.5:2 --seed 1", "morvik ber --ebn0 -1 --seed 1"),
+              "--ebn0 -1:0.5:2 instead of -1");
+    EXPECT_EQ(differenceOf("morvik ber --each-iteration --seed 1", "morvik ber --seed 2 --frames 0:5"),
+              "--each-iteration, --seed 1 instead of 2, without --frames");
+}
+
 }  // namespace

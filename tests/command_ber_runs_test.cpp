@@ -255,16 +255,14 @@ TEST_F(BerRuns, ResumeNoOtherRun)
     const Arguments again = Arguments{"ber", "--quiet", "--output", "results.csv"} + longPoint;
     const std::string place = "morvik ber: results.csv.checkpoint: ";
     expectRefused(again, place + "holds an unfinished run; --resume goes on with it, --overwrite starts anew");
-    for (const Arguments& other : {words("--seed 2"),
-                                   words("--scale 8"),
-                                   words("--num-pu 2"),
-                                   words("--block-errors 100000"),
-                                   Arguments{"--each-iteration"}}) {
-        expectRefused(
-            again + other + Arguments{"--resume"},
-            place +
-                "holds a run with other parameters: morvik ber --block-size 512 --num-pu 4 --algorithm scaled "
-                "--scale auto --iterations 8 --ebn0 1.4 --stop-bler 0 --frames 0:40000 --seed 1");
+    for (const auto& [other, difference] :
+         {std::pair("--seed 2", "--seed 1 instead of 2"),
+          std::pair("--scale 8", "--scale auto instead of 8"),
+          std::pair("--num-pu 2 --iterations 7", "--iterations 8 instead of 7, --num-pu 4 instead of 2"),
+          std::pair("--block-errors 100000", "without --block-errors"),
+          std::pair("--each-iteration", "without --each-iteration")}) {
+        expectRefused(again + words(other) + Arguments{"--resume"},
+                      place + "holds a run with other parameters: " + difference);
     }
     EXPECT_EQ(checkpoint(), kept);
 

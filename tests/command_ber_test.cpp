@@ -244,6 +244,22 @@ TEST_F(Ber, HoldsTheCommandThatRepeatsTheRun)
     EXPECT_EQ(berFile(Arguments(arguments.begin() + 2, arguments.end()), "b.json"), first);
 }
 
+TEST_F(Ber, HoldsRangesAsRanges)
+{
+    const auto ebn0Of = [this](const std::string& given) {
+        berFile(words("--block-size 40 --max-blocks 1 --ebn0 " + given), "a.json");
+        const Arguments command = words(nlohmann::json::parse(morvik.read("a.json")).at("command"));
+        const auto option = std::find(command.begin(), command.end(), "--ebn0");
+        return option == command.end() ? std::string() : *(option + 1);
+    };
+    EXPECT_EQ(ebn0Of("0:0.01:1"), "0:0.01:1");
+    EXPECT_EQ(ebn0Of("0,0.5,1"), "0:0.5:1");
+    EXPECT_EQ(ebn0Of("1,1.5"), "1,1.5");
+    EXPECT_EQ(ebn0Of("-1"), "-1");
+    EXPECT_EQ(ebn0Of("0:0.2:0.8,3,0.801,0.802"), "0:0.2:0.8,0.801,0.802,3");
+    EXPECT_EQ(ebn0Of("-0.3:0.1:0,1:1:3,7"), "-0.3:0.1:0,1:1:3,7");
+}
+
 // ---- What it prints
 
 TEST_F(Ber, PrintsATable)
