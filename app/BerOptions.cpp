@@ -279,7 +279,7 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
     command.add_flag("--overwrite", options.overwrite, "Replace earlier results, finished or not")
         ->needs(output)
         ->excludes(resume);
-    command.add_flag("--quiet", options.quiet, "Print no table")->needs(output);
+    command.add_flag("--quiet", options.quiet, "Print no table");
     command
         .add_option_function<std::string>(
             "--replay",
@@ -383,6 +383,11 @@ void addBerOptions(CLI::App& command, BerOptions& options)
     addRuleOptions(command, options);
     addExecutionOptions(command, options);
     addPictureOptions(command, options.pictures);
+    command.callback([&options] {
+        if (options.quiet && options.output.empty() && !options.pictures.isAskedFor()) {
+            throw CLI::RequiresError("--quiet", "--output, --plot or --report");
+        }
+    });
 }
 
 simulation::Plan planOf(const BerOptions& options)

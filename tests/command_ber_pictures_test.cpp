@@ -47,6 +47,13 @@ TEST_F(BerPictures, ShowEachCurveAndTheReferences)
     EXPECT_EQ(morvik.names(), (std::vector<std::string>{"curves.svg", "other.csv", "report.html"}));
 }
 
+TEST_F(BerPictures, AreEnoughForAQuietRun)
+{
+    EXPECT_EQ(ber(twoCurves + words("--quiet --plot curves.svg")), "");
+    EXPECT_EQ(ber(twoCurves + words("--quiet --report report.html")), "");
+    EXPECT_EQ(morvik.names(), words("curves.svg report.html"));
+}
+
 TEST_F(BerPictures, TellTheCountsAndHowTheRunIsRepeated)
 {
     const std::string rates = berFile(twoCurves + words("--seed 7 --report report.html"));

@@ -401,7 +401,7 @@ TEST_F(Ber, RefusesValuesThatAreGivenTwice)
 
 TEST_F(Ber, RefusesOptionsThatDoNotGoTogether)
 {
-    expectUsageError(words("--block-size 40 --quiet"), "--quiet requires --output");
+    expectUsageError(words("--block-size 40 --quiet"), "--quiet requires --output, --plot or --report");
     expectUsageError(words("--block-size 40 --resume"), "--resume requires --output");
     expectRefused(words("ber --block-size 40 --each-iteration --iterations 4,8"),
                   "morvik ber: --each-iteration counts up to one number of --iterations, give only the largest");
