@@ -14,6 +14,7 @@
 #include "Interruption.h"
 #include "LiveTable.h"
 #include "Pictures.h"
+#include "Text.h"
 #include "simulation/AtomicFile.h"
 #include "simulation/Error.h"
 #include "simulation/Journal.h"
@@ -49,12 +50,31 @@ std::unique_ptr<simulation::Workers> makeThreads(const BerOptions& options, cons
     return std::make_unique<simulation::ThreadWorkers>(plan, threads, options.instructionSet);
 }
 
-/// Throws Refusal, with the decoder's reason, if it knows no such instruction set.
+bool hasInstructionSet(const std::string& name)
+{
+    try {
+        Decoder(veltra_ip_morvik_v1_0_get_default_generics(), std::cerr).useInstructionSet(name);
+        return true;
+    } catch (const Refusal&) {
+        return false;
+    }
+}
+
+/// Throws Error if the decoder knows no such instruction set, or this machine does not have it.
 void checkInstructionSet(const std::string& name)
 {
-    if (!name.empty()) {
-        Decoder(veltra_ip_morvik_v1_0_get_default_generics(), std::cerr).useInstructionSet(name);
+    if (name.empty() || hasInstructionSet(name)) {
+        return;
     }
+    std::string message = "--instruction-set: " + shown(name) + " is not allowed, this machine has";
+    const char* separator = " ";
+    for (const char* const each : {"avx512", "avx2", "ssse3", "generic", "component"}) {
+        if (hasInstructionSet(each)) {
+            message += separator + std::string(each);
+            separator = ", ";
+        }
+    }
+    throw simulation::Error(message);
 }
 
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)

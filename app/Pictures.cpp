@@ -71,10 +71,11 @@ void addPictureOptions(CLI::App& command, PictureOptions& options)
     command.add_option("--report", options.report, "Write a page for a browser: curves, table, parameters")
         ->type_name("FILE.html");
     command
-        .add_option("--reference",
-                    options.references,
-                    "Draw the error rates of a CSV file, too, such as another result; can be given several times")
-        ->type_name("FILE.csv")
+        .add_option(
+            "--reference",
+            options.references,
+            "Draw the error rates of a file, too: another result, or published ones as CSV; can be given several times")
+        ->type_name("FILE")
         ->allow_extra_args(false);
 }
 

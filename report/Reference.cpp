@@ -1,4 +1,4 @@
-// Reference: curves to compare with, from CSV files.
+// Reference: curves to compare with, from CSV files and results.
 #include "Reference.h"
 
 #include <charconv>
@@ -11,6 +11,7 @@
 #include <system_error>
 
 #include "Wording.h"
+#include "simulation/ResultFiles.h"
 #include "simulation/TextFile.h"
 
 namespace report {
@@ -53,7 +54,8 @@ public:
 
     std::vector<Curve> read()
     {
-        std::istringstream lines(simulation::readText(itsName));
+        const bool isJson = std::filesystem::path(itsName).extension() == ".json";
+        std::istringstream lines(isJson ? csvText(simulation::readResults(itsName)) : simulation::readText(itsName));
         for (std::string line; std::getline(lines, line);) {
             ++itsLine;
             take(trimmed(line));

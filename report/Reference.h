@@ -1,4 +1,4 @@
-// Reference: curves to compare with, from CSV files.
+// Reference: curves to compare with, from CSV files and results.
 #ifndef MORVIK_REPORT_REFERENCE_H
 #define MORVIK_REPORT_REFERENCE_H
 
@@ -9,7 +9,8 @@
 
 namespace report {
 
-/// Reads published error rates or results of `morvik ber`, both CSV with comment lines that begin with #.
+/// Reads published error rates or results of `morvik ber`, both CSV with comment lines that begin with #; results as
+/// JSON, too, if the name ends in .json.
 ///
 /// The first line that is no comment names the columns, in any order: ebn0_db, and one of ber, bler and fer at least
 /// (fer is another name of bler). Read as well, if they are there: blocks or else frames, bit_errors, block_errors or

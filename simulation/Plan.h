@@ -2,6 +2,7 @@
 #ifndef MORVIK_SIMULATION_PLAN_H
 #define MORVIK_SIMULATION_PLAN_H
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <string>
@@ -40,6 +41,12 @@ struct Plan {
     std::uint64_t seed = 0;
     std::string version;
     std::string command;  // repeats the run; two plans are the same if their commands and versions are
+
+    /// How many frames of a point can count at most.
+    std::uint64_t mostFrames() const
+    {
+        return std::min(rules.maxBlocks.value_or(UINT64_MAX), frames.to - frames.from);
+    }
 
     /// How many counts of iterations are looked at in a point.
     std::size_t countsOf(const Point& point) const

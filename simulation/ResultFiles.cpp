@@ -57,9 +57,12 @@ void checkCounts(const ResultRow& row, const std::string& place)
 {
     const ErrorCounts& errors = row.errors;
     const std::uint64_t blocks = row.frames.size();
+    constexpr std::uint64_t mostBlocks = std::uint64_t{1} << 48;  // years of work, and products stay within 64 bits
     const std::uint64_t bits = blocks * row.point.blockSize;
-    if (errors.blockErrors > blocks || errors.bitErrors < errors.blockErrors || errors.bitErrors > bits ||
-        errors.bitErrorSquares < errors.bitErrors || errors.failures.size() > errors.blockErrors) {
+    if (blocks > mostBlocks || row.clipped > 3 * (bits + 4 * blocks) ||
+        errors.bitErrorSquares / row.point.blockSize > errors.bitErrors || errors.blockErrors > blocks ||
+        errors.bitErrors < errors.blockErrors || errors.bitErrors > bits || errors.bitErrorSquares < errors.bitErrors ||
+        errors.failures.size() > errors.blockErrors) {
         throw Error(place + ": numbers of errors that cannot be");
     }
 }

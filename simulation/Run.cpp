@@ -24,9 +24,6 @@ constexpr unsigned batchesAhead = 4;
 /// worker's may take of the memory.
 constexpr unsigned batchesWaiting = 64;
 
-/// As many frames as the encoder takes at a time.
-constexpr std::uint32_t smallestBatch = 64;
-
 /// A batch takes some milliseconds: long beside what handing it out takes, short beside what people notice.
 std::uint32_t largestBatch(const Point& point)
 {
@@ -98,7 +95,7 @@ private:
         const unsigned workers = itsParts.workers.count();
         const std::uint64_t counted = itsPlan.frames.from + itsCount.tally().blocks;
         const std::uint64_t furthestAhead = std::uint64_t{batchesWaiting} * workers * itsLargestBatch;
-        const std::uint64_t end = frameEnd();
+        const std::uint64_t end = itsPlan.frames.from + itsPlan.mostFrames();
         while (itsBatchesOut < batchesAhead * workers && itsNext < end && itsNext - counted < furthestAhead) {
             const auto count = static_cast<std::uint32_t>(std::min<std::uint64_t>(batchSize(), end - itsNext));
             itsParts.workers.handOut({itsResult.number, itsNext, count});
@@ -115,14 +112,6 @@ private:
         const std::uint64_t size = std::clamp<std::uint64_t>(share, smallestBatch, itsLargestBatch);
         const std::uint64_t unaligned = itsNext % smallestBatch;  // of a run that was resumed anywhere
         return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch - unaligned);
-    }
-
-    /// The first frame that surely does not count.
-    std::uint64_t frameEnd() const
-    {
-        const FrameRange& frames = itsPlan.frames;
-        const std::uint64_t most = itsPlan.rules.maxBlocks.value_or(UINT64_MAX);
-        return most < frames.to - frames.from ? frames.from + most : frames.to;
     }
 
     void takeResult()

@@ -1,6 +1,8 @@
 // ThreadWorkers: the threads of this process at work for a run.
 #include "ThreadWorkers.h"
 
+#include <algorithm>
+#include <cstdint>
 #include <string>
 #include <system_error>
 #include <utility>
@@ -12,13 +14,15 @@ namespace simulation {
 
 ThreadWorkers::ThreadWorkers(const Plan& plan, unsigned threads, const std::string& instructionSet)
 {
+    const std::uint64_t batches = (plan.mostFrames() - 1) / smallestBatch + 1;
+    const auto useful = static_cast<unsigned>(std::min<std::uint64_t>(threads, batches));
     try {
-        for (unsigned i = 0; i < threads; ++i) {
+        for (unsigned i = 0; i < useful; ++i) {
             itsThreads.emplace_back([this, &plan, instructionSet] { work(plan, instructionSet); });
         }
     } catch (const std::system_error& error) {
         endThreads();
-        throw Error(std::to_string(threads) + " threads cannot be started: " + error.code().message());
+        throw Error(std::to_string(useful) + " threads cannot be started: " + error.code().message());
     }
 }
 

@@ -17,6 +17,9 @@ struct FrameBatch {
     std::uint32_t count = 0;
 };
 
+/// Batches of a run have at least so many frames, if there are as many: what the encoder takes at a time.
+constexpr std::uint32_t smallestBatch = 64;
+
 /// What came of a batch.
 struct BatchResult {
     FrameBatch batch;

@@ -148,6 +148,20 @@ TEST(ThreadWorkers, GiveAllResults)
     }
 }
 
+TEST(ThreadWorkers, AreNoMoreThanThereAreBatches)
+{
+    Plan plan = planOf(false);
+    plan.rules.maxBlocks = 5;
+    EXPECT_EQ(ThreadWorkers(plan, 3, "").count(), 1U);
+    plan.rules.maxBlocks = 65;
+    EXPECT_EQ(ThreadWorkers(plan, 3, "").count(), 2U);
+    plan.frames = {7, 71};
+    EXPECT_EQ(ThreadWorkers(plan, 3, "").count(), 1U);
+    plan.frames = {0, UINT64_MAX};
+    plan.rules.maxBlocks.reset();
+    EXPECT_EQ(ThreadWorkers(plan, 3, "").count(), 3U);
+}
+
 TEST(ThreadWorkers, GiveNothingOfWhatIsForgotten)
 {
     const Plan plan = planOf(false);

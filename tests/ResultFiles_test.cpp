@@ -159,6 +159,12 @@ TEST_F(ResultFiles, WithImpossibleCountsAreRefused)
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",1601,4,1601,")), cannotBe);
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,27,")), cannotBe);
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,3,196,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,1160,")), cannotBe)
+        << "more than all bits of as few blocks";
+    EXPECT_EQ(refusal("a.csv", csvWith(",120,2.27", ",5281,2.27")), cannotBe) << "40 blocks have 5280 soft values";
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",0:18446744073709551615,18446744073709551615,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",5:281474976710662,281474976710657,")), cannotBe);
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",5:281474976710661,281474976710656,")), "none");
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,28,")), "none");
 }
 

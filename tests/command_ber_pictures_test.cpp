@@ -74,6 +74,20 @@ TEST_F(BerPictures, AreDrawnOfEarlierResultsToo)
     EXPECT_NE(morvik.read("again.svg").find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
 }
 
+TEST_F(BerPictures, TakeResultsOfEitherFormatAsReferences)
+{
+    berFile(twoCurves, "before.json");
+    berFile(twoCurves, "before.csv");
+    ber(twoCurves + words("--plot a.svg --reference before.json"));
+    ber(twoCurves + words("--plot b.svg --reference before.csv"));
+    EXPECT_NE(morvik.read("a.svg").find("before: K = 40, 4 units, max-log, 8 iterations"), std::string::npos);
+    EXPECT_TRUE(morvik.read("a.svg") == morvik.read("b.svg"));
+    morvik.write("bad.json", "{}");
+    const CommandResult bad = morvik.run(Arguments{"ber"} + twoCurves + words("--plot c.svg --reference bad.json"));
+    EXPECT_EQ(bad.status, 2);
+    EXPECT_EQ(bad.err.find("morvik ber: bad.json: is no result file ("), 0U) << bad.err;
+}
+
 TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)
 {
     expectRefusedAtOnce("--plot curves.gif",
