@@ -3,8 +3,10 @@
 
 #include <algorithm>
 #include <cmath>
+#include <initializer_list>
 #include <map>
 #include <sstream>
+#include <string_view>
 
 #include "link/DefaultScale.h"
 
@@ -106,20 +108,23 @@ std::string differenceOf(const std::string& command, const std::string& other)
     const auto ours = optionsOf(command);
     const auto theirs = optionsOf(other);
     std::string text;
-    const auto append = [&text](const std::string& part) {
-        text += (text.empty() ? "" : ", ") + part;
+    const auto append = [&text](std::initializer_list<std::string_view> parts) {
+        text += text.empty() ? "" : ", ";
+        for (const std::string_view part : parts) {
+            text += part;
+        }
     };
     for (const auto& [option, value] : ours) {
         const auto found = theirs.find(option);
         if (found == theirs.end()) {
-            append(option + (value.empty() ? "" : " ") + value);
+            append({option, value.empty() ? "" : " ", value});
         } else if (found->second != value) {
-            append(option + ' ' + value + " instead of " + found->second);
+            append({option, " ", value, " instead of ", found->second});
         }
     }
     for (const auto& [option, value] : theirs) {
         if (ours.count(option) == 0) {
-            append("without " + option);
+            append({"without ", option});
         }
     }
     return text;
