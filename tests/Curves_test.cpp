@@ -85,7 +85,7 @@ TEST(Curves, AgainstIterationsHaveTheSamplesOfAnEbn0)
     const Setting other{40, 8, "scaled", 6, ""};
     const auto curves = againstIterations(
         curvesOf({row(six, 1.0), row(six, 0.5), row(one, 0.5), row(one, 1.0), row(one, 2), row(other, 1.0)}));
-    EXPECT_EQ(titles(curves),
+    ASSERT_EQ(titles(curves),
               (std::vector<std::string>{"K = 512, 8 units, scaled, 0.50 dB", "K = 512, 8 units, scaled, 1.00 dB"}))
         << "where there are several";
     ASSERT_EQ(curves[1].samples.size(), 2U);
