@@ -1,4 +1,5 @@
-/* The batch interface of morvik: many code blocks of one size in one call, for simulations.
+/** @file
+ * The batch interface of morvik: many code blocks of one size in one call, for simulations.
  *
  * It works on the states of morvik_v1_0_bitacc_cmodel.h, which says what a state, a soft value, the tail
  * and a message are. A batch gives what the same blocks give when they are handed one after the other to
@@ -6,7 +7,7 @@
  * order, each kind once in the life of a state. Positions in warnings count within their block. Calls of
  * both headers may alternate on one state.
  *
- * Example: 1000 blocks of K = 512, eight iterations, soft values of 8 bits
+ * @par Example: 1000 blocks of K = 512, eight iterations, soft values of 8 bits
  *
  *     enum { blocks = 1000, K = 512 };
  *     static int8_t sys[blocks][K + 4], par1[blocks][K + 4], par2[blocks][K + 4];   // fill them in
@@ -29,36 +30,41 @@
 extern "C" {
 #endif
 
-/* What a batch delivers, block after block. The caller owns the record and the arrays; a member that is
+/** What a batch delivers, block after block. The caller owns the record and the arrays; a member that is
  * null is not wanted, but for `dout`.
  */
 typedef struct veltra_ip_morvik_v1_0_batch_outputs {
-    uint8_t* dout;       /* in:  hard decisions, K for each block, each 0 or 1                              */
-    size_t dout_alloc;   /* in:  number of elements that `dout` has room for                                */
-    int16_t* ratios;     /* in:  log-likelihood ratios of the last pass, K for each block, or null; 128
+    uint8_t* dout;       /**< in:  hard decisions, K for each block, each 0 or 1                            */
+    size_t dout_alloc;   /**< in:  number of elements that `dout` has room for                              */
+    int16_t* ratios;     /**< in:  log-likelihood ratios of the last pass, K for each block, or null; 128
                                  steps to one, positive for bit 1. They wrap like the hardware's 12-bit
                                  metrics and are multiples of 16                                            */
-    size_t ratios_alloc; /* in:  number of elements that `ratios` has room for                              */
-    uint32_t* tags;      /* in:  block tags, masked to C_TAG_WIDTH bits, one for each block, or null        */
-    size_t tags_alloc;   /* in:  number of elements that `tags` has room for                                */
-    uint32_t dout_size;  /* out: number of decisions of each block, K                                       */
+    size_t ratios_alloc; /**< in:  number of elements that `ratios` has room for                            */
+    uint32_t* tags;      /**< in:  block tags, masked to C_TAG_WIDTH bits, one for each block, or null      */
+    size_t tags_alloc;   /**< in:  number of elements that `tags` has room for                              */
+    uint32_t dout_size;  /**< out: number of decisions of each block, K                                     */
 } veltra_ip_morvik_v1_0_batch_outputs;
 
-/* Decodes `blocks` code blocks of K bits each.
+/** Decodes `blocks` code blocks of K bits each.
  *
- * rsc1_sys, rsc1_par, rsc2_par   the three streams, each `blocks` times din_size values, block after block
- * din_size                       positions of one block, K + 4
- * blocks                         number of blocks; 0 decodes nothing and returns 0
- * iterations                     number of full turbo iterations, 1 to 15
- * tags                           one tag for each block, or null: all tags are 0
- * outputs                        record with the "in" members set by the caller
+ * @param state         a live state
+ * @param rsc1_sys      systematic soft values, `blocks` times din_size of them, block after block
+ * @param rsc1_par      those of the first encoder's parity, likewise
+ * @param rsc2_par      those of the second encoder's parity, likewise
+ * @param din_size      positions of one block, K + 4
+ * @param blocks        number of blocks; 0 decodes nothing and returns 0
+ * @param iterations    number of full turbo iterations, 1 to 15
+ * @param tags          one tag for each block, or null: all tags are 0
+ * @param outputs       record with the "in" members set by the caller
  *
  * The three functions differ in the caller's type of soft values alone: 32, 16 and 8 bits.
  *
- * Returns 0, or the status of the first block that is refused, with its line on the standard error
- * stream, as veltra_ip_morvik_v1_0_bitacc_simulate does. All blocks share what is checked, so a batch is
- * decoded as a whole or not at all; on every status but 0 the outputs are left as they were, but for an
- * exhausted memory (99), where the blocks before may have been delivered. Two more reasons for status 1:
+ * @return 0, or the status of the first block that is refused, with its line on the standard error
+ *         stream, as veltra_ip_morvik_v1_0_bitacc_simulate does
+ *
+ * All blocks share what is checked, so a batch is decoded as a whole or not at all; on every status but 0
+ * the outputs are left as they were, but for an exhausted memory (99), where the blocks before may have
+ * been delivered. Two more reasons for status 1:
  *
  *     ERROR:decoder:Insufficient allocated space for ratios array
  *     ERROR:decoder:Insufficient allocated space for tags array
@@ -76,6 +82,7 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i32(veltra_ip_morvik_v1_
                                                             const uint32_t* tags,
                                                             veltra_ip_morvik_v1_0_batch_outputs* outputs);
 
+/** The same as veltra_ip_morvik_v1_0_batch_simulate_i32, from soft values of 16 bits. */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i16(veltra_ip_morvik_v1_0_state* state,
                                                             const int16_t* rsc1_sys,
                                                             const int16_t* rsc1_par,
@@ -86,6 +93,7 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i16(veltra_ip_morvik_v1_
                                                             const uint32_t* tags,
                                                             veltra_ip_morvik_v1_0_batch_outputs* outputs);
 
+/** The same as veltra_ip_morvik_v1_0_batch_simulate_i32, from soft values of 8 bits. */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i8(veltra_ip_morvik_v1_0_state* state,
                                                            const int8_t* rsc1_sys,
                                                            const int8_t* rsc1_par,
@@ -96,13 +104,23 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i8(veltra_ip_morvik_v1_0
                                                            const uint32_t* tags,
                                                            veltra_ip_morvik_v1_0_batch_outputs* outputs);
 
-/* Decodes `blocks` code blocks and counts the decisions that are wrong after each full iteration, for
+/** Decodes `blocks` code blocks and counts the decisions that are wrong after each full iteration, for
  * error-rate simulations. Decoding, refusals and warnings are those of the batch functions above.
  *
- * sent         the bits that were sent, K for each block, zero or not zero
- * errors       out: [block][iteration], the wrong decisions of the block after that full iteration; the
- *              last count of a block is that of its decisions with `iterations` iterations
- * errors_alloc number of elements that `errors` has room for
+ * @param state           a live state
+ * @param rsc1_sys        the three streams, as above
+ * @param rsc1_par        likewise
+ * @param rsc2_par        likewise
+ * @param din_size        positions of one block, K + 4
+ * @param blocks          number of blocks
+ * @param iterations      number of full turbo iterations, 1 to 15
+ * @param sent            the bits that were sent, K for each block, zero or not zero
+ * @param errors          out: [block][iteration], the wrong decisions of the block after that full
+ *                        iteration; the last count of a block is that of its decisions with
+ *                        `iterations` iterations
+ * @param errors_alloc    number of elements that `errors` has room for
+ *
+ * @return a status, as above
  *
  * Status 1 also has these reasons:
  *
@@ -121,6 +139,7 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i32(veltra_ip_morvik
                                                                 uint32_t* errors,
                                                                 size_t errors_alloc);
 
+/** The same as veltra_ip_morvik_v1_0_batch_count_errors_i32, from soft values of 16 bits. */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i16(veltra_ip_morvik_v1_0_state* state,
                                                                 const int16_t* rsc1_sys,
                                                                 const int16_t* rsc1_par,
@@ -132,6 +151,7 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i16(veltra_ip_morvik
                                                                 uint32_t* errors,
                                                                 size_t errors_alloc);
 
+/** The same as veltra_ip_morvik_v1_0_batch_count_errors_i32, from soft values of 8 bits. */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i8(veltra_ip_morvik_v1_0_state* state,
                                                                const int8_t* rsc1_sys,
                                                                const int8_t* rsc1_par,
@@ -143,16 +163,23 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i8(veltra_ip_morvik_
                                                                uint32_t* errors,
                                                                size_t errors_alloc);
 
-/* How a state computes. A new state takes the best way that the machine has; all give the same bits.
+/** Chooses how a state computes. A new state takes the best way that the machine has; all give the same bits.
  *
  *     avx512, avx2, ssse3    one lane for each segment of a block, on vectors of that instruction set
  *     generic                the same on what every machine has
  *     component              the components of the model one by one, as for a trace
  *
- * set_instruction_set takes one of these names and returns 0, or 1 after one line on the standard error
- * stream when the name is another or the machine lacks it. get_instruction_set returns the name in use.
+ * @param state    a live state
+ * @param name     one of these names
+ * @return 0, or 1 after one line on the standard error stream when the name is another or the machine lacks it
  */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_set_instruction_set(veltra_ip_morvik_v1_0_state* state, const char* name);
+
+/** Tells how a state computes.
+ *
+ * @param state    a live state
+ * @return the name in use, one of those above
+ */
 MORVIK_API const char* veltra_ip_morvik_v1_0_get_instruction_set(const veltra_ip_morvik_v1_0_state* state);
 
 #ifdef __cplusplus
