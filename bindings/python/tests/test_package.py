@@ -8,7 +8,6 @@ import sys
 from pathlib import Path
 
 import morvik
-import pytest
 
 PACKAGE = Path(morvik.__file__).parent
 
@@ -67,17 +66,6 @@ def test_everything_has_a_docstring():
 
 def test_example_of_the_docstring():
     assert doctest.testmod(morvik).failed == 0
-
-
-@pytest.mark.parametrize("document", ["docs/python.md"])
-def test_examples_of_documents(repository, document):
-    text = (repository / document).read_text().replace("```", "")
-    test = doctest.DocTestParser().get_doctest(text, {}, document, document, 0)
-    output = []
-    runner = doctest.DocTestRunner(optionflags=doctest.ELLIPSIS)
-    runner.run(test, out=output.append)
-    assert runner.failures == 0, "".join(output)
-    assert runner.tries > 20
 
 
 def test_version_is_that_of_the_project(repository):
