@@ -1,12 +1,26 @@
 #!/usr/bin/env python3
-"""Draws the pictures of docs/arithmetic.md: trellis.svg and windows.svg, beside this file."""
+"""Draws the pictures of docs/algorithm.md and docs/arithmetic.md, SVG files beside this one.
 
+    pictures.py [FOLDER]     FOLDER is where the pictures go, if not beside this file
+
+Interleaver, windows and border metrics are those of the model: build/x86_64/bin/morvik has to be built.
+"""
+
+import csv
+import json
 import pathlib
+import subprocess
+import sys
+import tempfile
 
-FOLDER = pathlib.Path(__file__).parent
+HERE = pathlib.Path(__file__).resolve().parent
+FOLDER = pathlib.Path(sys.argv[1]) if len(sys.argv) > 1 else HERE
+MORVIK = HERE.parent / "build/x86_64/bin/morvik"
 STYLE = """<style>
 text { font: 14px sans-serif; fill: #222 } .small { font-size: 12px } .light { fill: #777 }
 .one { stroke: #1f5f99; stroke-width: 2 } .zero { stroke: #b5541c; stroke-width: 2; stroke-dasharray: 7 5 }
+.dots { stroke-width: 3.2; stroke-linecap: round; fill: none } .line { stroke: #222; stroke-width: 1.5; fill: none }
+.earlier { stroke: #1f5f99; stroke-width: 2; fill: none } .same { stroke: #b5541c; stroke-width: 2; fill: none }
 .state { fill: #fff; stroke: #222; stroke-width: 1.5 } .box { stroke: #fff; stroke-width: 1.5 }
 @media (prefers-color-scheme: dark) { svg { background: #fff } }
 </style>"""
@@ -16,6 +30,10 @@ def svg(width, height, elements):
     return (f'<svg xmlns="http://www.w3.org/2000/svg" viewBox="0 0 {width} {height}" '
             f'width="{width}" height="{height}">\n<rect width="100%" height="100%" fill="#fff"/>\n{STYLE}\n'
             + "\n".join(elements) + "\n</svg>\n")
+
+
+def printed(*arguments):
+    return subprocess.run([MORVIK, *arguments], stdout=subprocess.PIPE, text=True, check=True).stdout
 
 
 def text(x, y, content, anchor="middle", kind=""):
@@ -53,7 +71,10 @@ def trellis():
 
 def windows():
     """K = 1280 with two units: eight segments of 160 steps, three windows each."""
-    segments, lengths = 8, (64, 48, 48)
+    division = json.loads(printed("info", "1280", "--json"))["divisions"][0]
+    segments, lengths = division["segments"], division["window_lengths"]
+    order = [(window["segment"], window["row"]) for window in division["windows"]]
+    assert (division["num_pu"], segments, len(lengths)) == (2, 8, 3)
     left, top, height, scale = 84, 60, 46, 0.66
     shades = ("#1f5f99", "#5b93c4", "#a9c8e4")
     elements = [text(left, 24, "K = 1280, two processing units with four threads each: 8 segments, 3 rows of windows",
@@ -66,7 +87,7 @@ def windows():
         for row, length in enumerate(lengths):
             elements.append(f'<rect x="{x + offset * scale:.1f}" y="{top}" width="{length * scale:.1f}" '
                             f'height="{height}" fill="{shades[row]}" class="box"/>')
-            number = row * segments + segment
+            number = order.index((segment, row))
             elements.append(f'<text x="{x + (offset + length / 2) * scale:.1f}" y="{top + height / 2 + 5}" '
                             f'text-anchor="middle" style="fill:{"#fff" if row < 2 else "#222"}">{number}</text>')
             offset += length
@@ -92,5 +113,201 @@ def windows():
     return svg(int(left + segments * width + 20), bottom + 20, elements)
 
 
-(FOLDER / "trellis.svg").write_text(trellis())
-(FOLDER / "windows.svg").write_text(windows())
+def arrow(x1, y1, x2, y2, kind="line"):
+    """A straight line with a head at its end; horizontal or vertical."""
+    if y1 == y2:
+        side = 1 if x2 > x1 else -1
+        head = f"m{-6 * side} -4 l{6 * side} 4 l{-6 * side} 4"
+    else:
+        side = 1 if y2 > y1 else -1
+        head = f"m-4 {-6 * side} l4 {6 * side} l4 {-6 * side}"
+    return f'<path d="M{x1:.1f} {y1:.1f} L{x2:.1f} {y2:.1f} {head}" class="{kind}"/>'
+
+
+def box(x, y, width, height, *lines):
+    top = y + height / 2 + 5 - 8 * (len(lines) - 1)
+    return [f'<rect x="{x}" y="{y}" width="{width}" height="{height}" rx="4" class="state"/>',
+            *(text(x + width / 2, top + 16 * i, line, kind="small" if i else "") for i, line in enumerate(lines))]
+
+
+def turbo():
+    """The code, and the decoder's two passes that hand extrinsic values to each other."""
+    elements = [text(20, 28, "Encoder", "start"), text(20, 206, "Decoder", "start")]
+    elements += [text(30, 62, "bits", "start", "small"), arrow(60, 58, 420, 58), text(430, 62, "systematic", "start")]
+    elements += ['<path d="M100 58 V152" class="line"/>', arrow(100, 102, 250, 102), arrow(380, 102, 420, 102)]
+    elements += box(250, 84, 130, 36, "first encoder") + [text(430, 107, "first parity", "start")]
+    elements += [arrow(100, 152, 150, 152), arrow(215, 152, 250, 152), arrow(380, 152, 420, 152)]
+    elements += box(150, 134, 65, 36, "Π") + box(250, 134, 130, 36, "second encoder")
+    elements += [text(430, 157, "second parity", "start")]
+
+    elements += box(60, 250, 180, 62, "second code", "even half-iterations", "interleaved order")
+    elements += box(400, 250, 180, 62, "first code", "odd half-iterations", "natural order")
+    elements += box(290, 232, 60, 30, "Π⁻¹") + box(290, 300, 60, 30, "Π")
+    elements += [arrow(240, 256, 290, 256), arrow(350, 256, 400, 256), arrow(400, 306, 350, 306), arrow(290, 306, 240, 306)]
+    elements += [text(320, 224, "extrinsic values", kind="small"), text(320, 348, "extrinsic values", kind="small")]
+    elements += [arrow(150, 366, 150, 312), text(150, 384, "systematic (Π), second parity", kind="small")]
+    elements += [arrow(490, 366, 490, 312), text(490, 384, "systematic, first parity", kind="small")]
+    elements += [arrow(580, 281, 620, 281), text(628, 285, "ratios, decisions", "start", "small")]
+    return svg(750, 400, elements)
+
+
+def table(*arguments):
+    """What a subcommand prints as CSV: a list of rows, which map columns to integers."""
+    rows = csv.DictReader(printed(*arguments).splitlines())
+    return [{name: int(value) for name, value in row.items()} for row in rows]
+
+
+def interleaver():
+    """K = 512, eight segments: every position, and the eight that are computed at the same time."""
+    size, segments, step = 512, 8, 21
+    length = size // segments
+    pi = [row["pi"] for row in table("info", str(size), "--table")]
+    left, top, scale = 90, 60, 0.8
+    side = size * scale
+
+    def at(i):
+        return left + i * scale, top + pi[i] * scale
+
+    elements = [text(left, 24, f"Bit i of the second encoder is bit Π(i): K = {size}, {segments} segments", "start"),
+                f'<rect x="{left}" y="{top}" width="{side}" height="{side}" class="state"/>']
+    for border in range(1, segments):
+        offset = border * length * scale
+        elements.append(f'<path d="M{left + offset} {top} v{side} M{left} {top + offset} h{side}" stroke="#ccc"/>')
+    for segment in range(segments):
+        middle = (segment + 0.5) * length * scale
+        elements.append(text(left + middle, top - 8, segment, kind="small light"))
+        elements.append(text(left - 8, top + middle + 5, segment, "end", "small light"))
+    dots = "".join(f"M{x:.1f} {y:.1f}h0" for x, y in map(at, range(size)))
+    elements.append(f'<path d="{dots}" class="dots" stroke="#5b93c4"/>')
+    together = range(step, size, length)
+    assert sorted(pi[i] // length for i in together) == list(range(segments))  # no two from one segment
+    assert len({pi[i] % length for i in together}) == 1  # all at the same step of theirs
+    for x, y in map(at, together):
+        elements.append(f'<circle cx="{x:.1f}" cy="{y:.1f}" r="5" fill="#b5541c"/>')
+    origin = pi[step] % length
+    elements += [text(left + side / 2, top + side + 24, "i, the order of the second code, by segments"),
+                 f'<text transform="translate(28 {top + side / 2}) rotate(-90)" text-anchor="middle">Π(i), by segments</text>']
+    note = left + side + 24
+    for line, words in enumerate((f"Step {step} of all segments,", "computed at the same time:",
+                                  f"step {origin} of all segments", "of the natural order,", "one from each.")):
+        elements.append(text(note, top + 24 + 20 * line, words, "start"))
+    return svg(int(note + 210), int(top + side + 40), elements)
+
+
+class Block:
+    """The metrics of a noisy block as the model traces them, and what one more step makes of them."""
+
+    def __init__(self, size, passes):
+        with tempfile.TemporaryDirectory() as folder:
+            name = pathlib.Path(folder) / "block"
+            subprocess.run([MORVIK, "ber", "--block-size", str(size), "--ebn0", "0.4", "--num-pu", "2", "--replay", "0:0",
+                            "--output", f"{name}.csv"], stdout=subprocess.DEVNULL, check=True)
+            traced = table("trace", f"{name}.point0.frame0.csv", "--half-iterations", f"0:{passes - 1}", "--format", "csv")
+        self.size = size
+        self.passes = [[row for row in traced if row["half_iteration"] == h] for h in range(passes)]
+
+    def column(self, h, step, kind):
+        return [self.passes[h][step][f"{kind}{state}"] for state in range(8)]
+
+    def forward(self, h, step):
+        """The forward metrics behind a step."""
+        metrics, found = self.column(h, step, "alpha"), {}
+        for state in range(8):
+            for bit in (0, 1):
+                found[successor(state, bit), bit] = self.branch(h, step, state, bit, metrics[state])
+        return [greater(found[state, 1], found[state, 0]) for state in range(8)]
+
+    def backward(self, h, step):
+        """The backward metrics before a step."""
+        metrics = self.column(h, step, "beta")
+        return [greater(*(self.branch(h, step, state, bit, metrics[successor(state, bit)]) for bit in (1, 0)))
+                for state in range(8)]
+
+    def branch(self, h, step, state, bit, metric):
+        weight = self.passes[h][step][f"g{state // 2}"]
+        return wrapped(metric + weight if bit else metric - weight)
+
+    def starts(self, name):
+        """Where segments or windows begin, but for the first."""
+        rows = self.passes[0][:self.size]
+        names = ("segment", "window")[:1 if name == "segment" else 2]
+        return [k for k in range(1, self.size) if any(rows[k][each] != rows[k - 1][each] for each in names)]
+
+    def origin(self, h, start, candidates):
+        """The one pass in which the column was computed that a recursion starts from, of some candidates by pass."""
+        passes = [q for q, column in candidates.items() if [wrapped(m & ~7) for m in column] == start]
+        assert len(passes) == 1, (h, passes)
+        return passes[0]
+
+
+def wrapped(metric):
+    return (metric + 2048) % 4096 - 2048
+
+
+def greater(one, zero):
+    return zero if wrapped(one - zero) < 0 else one
+
+
+def borders():
+    """What the recursions of half-iteration 2 start from, as the values show: K = 1280, two units, three rows."""
+    block, now = Block(1280, 3), 2
+    shown, left, top, height, scale = 3, 130, 84, 30, 1.25
+    segment_starts, window_starts = block.starts("segment"), block.starts("window")
+    length = segment_starts[0]
+    width = shown * length * scale
+    right = left + width
+
+    def strip(y, label, windows):
+        parts = [f'<rect x="{left}" y="{y}" width="{width}" height="{height}" fill="#dce8f2"/>',
+                 text(left - 10, y + height / 2 + 5, label, "end", "small")]
+        for k in windows:
+            parts.append(f'<path d="M{left + k * scale} {y} v{height}" stroke="#fff" stroke-width="2"/>')
+        for k in [0, *segment_starts[:shown - 1]]:
+            parts.append(f'<path d="M{left + k * scale} {y - 4} v{height + 8}" stroke="#222" stroke-width="1.5"/>')
+        return parts
+
+    def border(k, y, origin, side):
+        """From the end of one recursion to the start of another, to the right (1) or left (-1) of step k."""
+        x = left + k * scale
+        if origin == now:
+            low = y + 74 + height + 6
+            return [f'<path d="M{x - 14 * side:.1f} {low} v8 h{28 * side} v-8 m-4 6 l4 -6 l4 6" class="same"/>']
+        return [f'<path d="M{x - 7 * side:.1f} {y + height} v18 L{x + 7 * side:.1f} {y + 62} v10 m-4 -6 l4 6 l4 -6" '
+                'class="earlier"/>']
+
+    elements = [text(20, 24, "K = 1280, two processing units: the first 3 of 8 segments, each with 3 windows (rows 0, 1 and 2)",
+                     "start")]
+    for y, title in ((top, "Forward: where segments begin"), (top + 190, "Backward: where windows end")):
+        elements.append(text(20, y - 22, title, "start"))
+        within = [k for k in window_starts if k < shown * length]
+        forward = y == top
+        elements += strip(y, "half-iteration 0", () if forward else within)
+        elements += strip(y + 74, "half-iteration 2", () if forward else within)
+        for k in (segment_starts[:shown - 1] if forward else [*within, segment_starts[shown - 1]]):
+            if forward:
+                origin = block.origin(now, block.column(now, k, "alpha"), {q: block.forward(q, k - 1) for q in (0, 1, 2)})
+            else:
+                origin = block.origin(now, block.column(now, k - 1, "beta"), {q: block.backward(q, k) for q in (0, 1, 2)})
+            elements += border(k, y, origin, 1 if forward else -1)
+        if forward:
+            elements += [arrow(left - 26, y + 126, left + 6, y + 126), text(left - 32, y + 131, "known state", "end", "small")]
+    last = top + 190
+    elements.append(text(right + 14, last + 74 + height / 2 + 5, "... the last window: the tail's column", "start", "small"))
+
+    key = last + 150
+    elements += [f'<path d="M{left} {key} h40" class="earlier"/>',
+                 text(left + 50, key + 5, "from the last pass over the same code (the first one starts from zeros)", "start", "small"),
+                 f'<path d="M{left} {key + 22} h40" class="same"/>',
+                 text(left + 50, key + 27, "from this pass: row 0 is computed before row 2", "start", "small")]
+    k = segment_starts[0]
+    for line, (label, column) in enumerate(((f"computed behind step {k - 1}, half-iteration 0", block.forward(0, k - 1)),
+                                            (f"the start of segment 1, half-iteration {now}", block.column(now, k, "alpha")))):
+        y = key + 62 + 20 * line
+        elements.append(text(left + 270, y, label, "end", "small"))
+        elements += [text(left + 330 + 44 * state, y, metric, "end", "small") for state, metric in enumerate(column)]
+    elements.append(text(left + 270, key + 104, "the low three of the traced bits are cleared (rule 11)", "end", "small light"))
+    return svg(int(right + 250), key + 124, elements)
+
+
+for picture in (trellis, windows, turbo, interleaver, borders):
+    (FOLDER / f"{picture.__name__}.svg").write_text(picture())
