@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Runs at a desk what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
-# Stages: format lint lint-tests compilers abi memory threads fuzz coverage tests, and only when they are named:
+# Stages: format lint lint-tests docs compilers abi memory threads fuzz coverage tests, and only when they are named:
 # abi-renew mutate
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -36,6 +36,11 @@ tidy() {
     git ls-files "$@" |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp|bindings/octave/morvik_mex\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
+}
+
+# The site of the documents, warnings as errors. That their code blocks run is a test.
+stage_docs() {
+    scripts/docs
 }
 
 # Both compilers, all warnings as errors; g++ is in the stage of the tests.
@@ -131,10 +136,10 @@ stage_tests() {
 }
 
 scripts/setup --checks --tests
-[ $# -gt 0 ] || set -- format lint lint-tests compilers abi memory threads fuzz coverage tests
+[ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads fuzz coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests compilers abi memory threads fuzz coverage tests abi-renew mutate" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads fuzz coverage tests abi-renew mutate" >&2
         exit 2
     fi
     echo "== $stage"
