@@ -9,6 +9,7 @@ are what commands print, where `...` stands for what is left out and figures of 
 comments that tell these, and which blocks are not run. Every other block is a mistake.
 """
 
+import difflib
 import doctest
 import json
 import os
@@ -113,7 +114,8 @@ class Document:
         if printed is None:
             raise Mistake(f"{block.place}: nothing was run whose output this could be")
         if not re.fullmatch(pattern_of(block.text), "".join(line + "\n" for line in lines_of(printed))):
-            raise Mistake(f"{block.place}: shown is\n{block.text}and printed\n{printed}")
+            difference = difflib.unified_diff(lines_of(block.text), lines_of(printed), "shown", "printed", lineterm="")
+            raise Mistake(f"{block.place}: what is shown is not what is printed\n" + "\n".join(difference))
 
     def write(self, block, following):
         name = block.told["file"]

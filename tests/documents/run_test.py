@@ -53,8 +53,8 @@ class Documents(unittest.TestCase):
         self.run_document(shown("done, 2.5 Mbit/s\\n", "done, 17 Mbit/s"))
         self.run_document(shown("x\\n", "y", "output of: echo y"))
         for printed, text in (("a\\nb\\n", "a"), ("a\\n", "a\nb"), ("a 1\\n", "a 2"), ("b\\nc\\n", "a\n..."), ("a+\\n", "aa")):
-            self.refuses(shown(printed, text), "shown is")
-        self.refuses(shown("x\\n", "y", "output of: echo x"), "shown is")
+            self.refuses(shown(printed, text), "is not what is printed")
+        self.refuses(shown("x\\n", "y", "output of: echo x"), "is not what is printed")
         self.refuses(block("x", "output", language=""), "nothing was run")
         self.refuses(block("echo x", "not run: y") + block("x", "output", language=""), "nothing was run")
 
