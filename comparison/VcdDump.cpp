@@ -25,6 +25,7 @@ constexpr unsigned nobody = ~0U;
 
 /// The variables of a scope that count. Those of a scope around it stand for what it lacks itself.
 struct Scope {
+    std::string name;
     unsigned parent = nobody;
     unsigned pass = nobody;  // variables
     unsigned step = nobody;
@@ -110,11 +111,7 @@ private:
         }
         if (command == "$scope") {
             expectWord("the kind of a scope");
-            expectWord("the name of a scope");
-            Scope scope;
-            scope.parent = itsScope;
-            itsScope = static_cast<unsigned>(itsScopes.size());
-            itsScopes.push_back(scope);
+            enterScope(expectWord("the name of a scope"));
         } else if (command == "$upscope") {
             if (itsScope == nobody) {
                 itsFile.fail("$upscope outside of all scopes");
@@ -127,6 +124,22 @@ private:
         }
         nextWord();
         skipToEnd();
+    }
+
+    /// A dump may come back to a scope that it has left.
+    void enterScope(const std::string& name)
+    {
+        unsigned scope = 0;
+        while (scope < itsScopes.size() && (itsScopes[scope].parent != itsScope || itsScopes[scope].name != name)) {
+            ++scope;
+        }
+        if (scope == itsScopes.size()) {
+            Scope entered;
+            entered.name = name;
+            entered.parent = itsScope;
+            itsScopes.push_back(entered);
+        }
+        itsScope = scope;
     }
 
     void forgetAll()

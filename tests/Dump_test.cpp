@@ -206,6 +206,17 @@ TEST(VcdDump, CountsOnlyWhatIsValid)
     EXPECT_EQ(dump.values.at({0, llr, 1}), 5);
 }
 
+TEST(VcdDump, ComesBackToAScope)
+{
+    const Dump dump = read(readVcd,
+                           "$scope module tb $end\n$scope module core $end\n$var wire 5 h half_iteration $end\n"
+                           "$var wire 13 s step $end\n$upscope $end\n$upscope $end\n"
+                           "$scope module tb $end\n$scope module core $end\n$scope module ratio $end\n"
+                           "$var wire 12 l llr $end\n$upscope $end\n$upscope $end\n$upscope $end\n"
+                           "$enddefinitions $end\n#0\nb1 h\nb10 s\nb101 l\n");
+    EXPECT_EQ(dump.values.at({1, llr, 2}), 5);
+}
+
 TEST(VcdDump, NamesThePlaceOfAMistake)
 {
     const std::string start = "$scope module core $end\n$var wire 13 s step $end\n";
