@@ -3,9 +3,12 @@
 #include <array>
 #include <cmath>
 #include <cstddef>
+#include <cstdint>
+#include <iterator>
 #include <map>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "Dump.h"
@@ -22,6 +25,20 @@ using simulation::shown;
 enum class Role : std::uint8_t { pass, step, valid, signal };
 
 constexpr unsigned nobody = ~0U;
+
+/// A digit of a vector: 0, 1, or unknown. VHDL has nine states (IEEE 1076, package std_logic_1164), L and H weak 0
+/// and 1.
+enum class Digit : std::uint8_t { zero, one, unknown, none };
+
+Digit digitOf(char character)
+{
+    constexpr std::string_view ofAKind[] = {"0L", "1H", "xXzZUW-"};
+    std::uint8_t kind = 0;
+    while (kind < std::size(ofAKind) && ofAKind[kind].find(character) == std::string_view::npos) {
+        ++kind;
+    }
+    return static_cast<Digit>(kind);
+}
 
 /// The variables of a scope that count. Those of a scope around it stand for what it lacks itself.
 struct Scope {
@@ -203,7 +220,7 @@ private:
         if (kind == 'b' || kind == 'B' || kind == 'r' || kind == 'R') {
             digits.erase(0, 1);
             identifier = expectWord("the identifier of a variable");
-        } else if (kind == '0' || kind == '1' || kind == 'x' || kind == 'X' || kind == 'z' || kind == 'Z') {
+        } else if (digitOf(kind) != Digit::none) {
             identifier = digits.substr(1);
             digits.resize(1);
         } else if (kind == 's' || kind == 'S') {
@@ -257,19 +274,21 @@ private:
     std::optional<std::int64_t> bitsValue(const Variable& variable, const std::string& digits) const
     {
         std::int64_t value = 0;
-        for (const char digit : digits) {
-            if (digit != '0' && digit != '1') {
-                if (std::string("xXzZ").find(digit) == std::string::npos) {
-                    itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected binary digits");
-                }
+        for (const char character : digits) {
+            const Digit digit = digitOf(character);
+            if (digit == Digit::none) {
+                itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected binary digits");
+            }
+            if (digit == Digit::unknown) {
                 return std::nullopt;
             }
-            value = 2 * value + (digit - '0');
+            value = 2 * value + (digit == Digit::one ? 1 : 0);
             if (value >> 32 != 0) {
                 itsFile.fail(variable.name + " has more than 32 bits");
             }
         }
-        const bool isNegative = variable.role == Role::signal && digits.size() >= variable.bits && digits[0] == '1';
+        const bool isNegative =
+            variable.role == Role::signal && digits.size() >= variable.bits && digitOf(digits[0]) == Digit::one;
         return isNegative ? value - (std::int64_t{1} << digits.size()) : value;
     }
 

@@ -217,6 +217,19 @@ TEST(VcdDump, ComesBackToAScope)
     EXPECT_EQ(dump.values.at({1, llr, 2}), 5);
 }
 
+TEST(VcdDump, ReadsTheNineStatesOfVhdl)
+{
+    const Dump dump = read(readVcd,
+                           "$scope module core $end\n$var integer 32 h half_iteration $end\n"
+                           "$var reg 13 s step[12:0] $end\n$var reg 12 l llr[11:0] $end\n$var reg 1 c clk $end\n"
+                           "$var reg 12 a alpha3[11:0] $end\n$upscope $end\n$enddefinitions $end\n"
+                           "#0\nUc\nb0 h\nbUUUUUUUUUUUUU s\nbZWX-UUUUUUUU l\nb0 a\n"
+                           "#1\nHc\nb1 s\n#2\n-c\nb10 s\nbHHHHHHHHHHHL l\n");
+    EXPECT_FALSE(dump.values.has({0, llr, 1}));
+    EXPECT_EQ(dump.values.at({0, alpha3, 1}), 0);
+    EXPECT_EQ(dump.values.at({0, llr, 2}), -2);
+}
+
 TEST(VcdDump, NamesThePlaceOfAMistake)
 {
     const std::string start = "$scope module core $end\n$var wire 13 s step $end\n";
