@@ -57,7 +57,6 @@ struct Variable {
     Role role = Role::signal;
     unsigned signal = 0;
     unsigned bits = 0;
-    bool isReal = false;
     std::optional<std::int64_t> value;  ///< none while unknown
     std::uint32_t line = 0;             ///< where it has changed
 };
@@ -111,12 +110,18 @@ private:
         return std::string(itsWord);
     }
 
-    void skipToEnd()
+    /// The words up to $end, without blanks between them.
+    std::string restOfCommand()
     {
-        while (itsWord != "$end") {
+        std::string rest;
+        for (;;) {
             if (!nextWord()) {
                 itsFile.fail("a command without $end");
             }
+            if (itsWord == "$end") {
+                return rest;
+            }
+            rest += itsWord;
         }
     }
 
@@ -136,11 +141,11 @@ private:
             itsScope = itsScopes[itsScope].parent;
         } else if (command == "$var") {
             readVariable();
+            return;
         } else if (command == "$dumpoff") {
             forgetAll();
         }
-        nextWord();
-        skipToEnd();
+        restOfCommand();
     }
 
     /// A dump may come back to a scope that it has left.
@@ -169,17 +174,17 @@ private:
     void readVariable()
     {
         Variable variable;
-        variable.isReal = expectWord("the kind of a variable") == "real";
+        expectWord("the kind of a variable");
         const std::string width = expectWord("the width of a variable");
-        variable.bits = itsFile.count("width", width, 1, 65536) + 1;
         const std::string identifier = expectWord("the identifier of a variable");
         variable.name = expectWord("the name of a variable");
+        variable.name = plainName(variable.name + restOfCommand());
         if (itsScope == nobody) {
             itsFile.fail("variable " + shown(variable.name) + " outside of all scopes");
         }
         variable.scope = itsScope;
-        variable.name = variable.name.substr(0, variable.name.find('['));
         if (takesPart(variable)) {
+            variable.bits = itsFile.count("width", width, 1, 65536) + 1;
             itsByIdentifier[identifier].push_back(static_cast<unsigned>(itsVariables.size()));
             itsVariables.push_back(variable);
         } else {
@@ -187,19 +192,55 @@ private:
         }
     }
 
+    /// Without the range of bits, and the mark of a name that is no identifier. An element, NAME[N], keeps its number.
+    static std::string plainName(std::string name)
+    {
+        const std::size_t bracket = name.rfind('[');
+        if (bracket != std::string::npos && name.find(':', bracket) != std::string::npos) {
+            name.erase(bracket);
+        }
+        name.erase(0, name[0] == '\\' ? 1 : 0);
+        return name;
+    }
+
+    /// The variable's name, and the same behind the scope that it is in, behind the one around that, and so on.
+    std::vector<std::string> namesOf(const Variable& variable) const
+    {
+        std::vector<std::string> names = {variable.name};
+        for (unsigned scope = variable.scope; scope != nobody; scope = itsScopes[scope].parent) {
+            names.push_back(itsScopes[scope].name + '.' + names.back());
+        }
+        return names;
+    }
+
+    /// What the longest name that the map has says of the variable.
+    std::optional<unsigned> signalOf(const std::vector<std::string>& names) const
+    {
+        std::optional<unsigned> signal;
+        for (const std::string& name : names) {
+            const auto known = itsMap.signal(name);
+            signal = known ? known : signal;
+        }
+        return signal;
+    }
+
     /// Finds out what the variable is for; false when it does not count.
     bool takesPart(Variable& variable)
     {
         Scope& scope = itsScopes[variable.scope];
         const auto number = static_cast<unsigned>(itsVariables.size());
-        const auto signal = itsMap.signal(variable.name);
-        if (variable.name == itsMap.passColumn) {
+        const std::vector<std::string> names = namesOf(variable);
+        const auto isCalled = [&names](const std::string& name) {
+            return std::find(names.begin(), names.end(), name) != names.end();
+        };
+        const auto signal = signalOf(names);
+        if (isCalled(itsMap.passColumn)) {
             variable.role = Role::pass;
             scope.pass = number;
-        } else if (variable.name == itsMap.stepColumn) {
+        } else if (isCalled(itsMap.stepColumn)) {
             variable.role = Role::step;
             scope.step = number;
-        } else if (!itsMap.valid.empty() && variable.name == itsMap.valid) {
+        } else if (!itsMap.valid.empty() && isCalled(itsMap.valid)) {
             variable.role = Role::valid;
             scope.valid = number;
         } else if (signal && *signal != NameMap::leftOut) {
@@ -234,13 +275,13 @@ private:
             itsFile.fail("no variable has the identifier " + shown(identifier));
         }
         for (const unsigned number : found->second) {
-            change(itsVariables[number], digits);
+            change(itsVariables[number], digits, kind == 'r' || kind == 'R');
         }
     }
 
-    void change(Variable& variable, const std::string& digits)
+    void change(Variable& variable, const std::string& digits, bool isReal)
     {
-        variable.value = variable.isReal ? realValue(variable, digits) : bitsValue(variable, digits);
+        variable.value = isReal ? realValue(variable, digits) : bitsValue(variable, digits);
         variable.line = itsFile.number();
         itsScopes[variable.scope].changed = true;
         // What a scope says of its place holds for those in it, too, and they come behind it.

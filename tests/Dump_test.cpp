@@ -230,6 +230,31 @@ TEST(VcdDump, ReadsTheNineStatesOfVhdl)
     EXPECT_EQ(dump.values.at({0, llr, 2}), -2);
 }
 
+TEST(VcdDump, TellsElementsAndScopesApart)
+{
+    const NameMap map = mapOf(R"({"signals": {"a[3]": "alpha3", "ratio.data": "llr", "core.data": "beta0",
+                                              "old.ratio.data": null}, "columns": {"step": "core.k"}})");
+    const std::string data = "$scope module ratio $end\n$var wire 12 l data [11:0] $end\n$upscope $end\n";
+    const Dump dump = read(readVcd,
+                           "$scope module core $end\n$var wire 5 h half_iteration $end\n$var wire 13 k k $end\n"
+                           "$var wire 12 a2 a[2] [11:0] $end\n$var wire 12 a3 \\a[3] [11:0] $end\n"
+                           "$var wire 1 b3 alpha3 [3] $end\n$var wire 100000 w wide [99999:0] $end\n"
+                           "$var wire 12 d data[11:0] $end\n" +
+                               data + "$scope module old $end\n" + data +
+                               "$upscope $end\n$upscope $end\n$enddefinitions $end\n"
+                               "#0\nb0 h\nb1 k\nb10 a2\nb11 a3\n1b3\nb100 d\nb101 l\n",
+                           map);
+    constexpr unsigned beta0 = 13;
+    EXPECT_EQ(dump.values.at({0, alpha3, 1}), 3);
+    EXPECT_EQ(dump.values.at({0, beta0, 1}), 4);
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 5);
+    const NameMap none = mapOf(R"({"signals": {"ratio.data": "llr", "core.ratio.data": null}})");
+    expectRefused(readVcd,
+                  "$scope module core $end\n" + data + "$upscope $end\n$enddefinitions $end\n",
+                  "dump:6: no variable of the dump is a signal that is known; a map tells which is which",
+                  none);
+}
+
 TEST(VcdDump, NamesThePlaceOfAMistake)
 {
     const std::string start = "$scope module core $end\n$var wire 13 s step $end\n";
