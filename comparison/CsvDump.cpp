@@ -41,6 +41,14 @@ std::optional<std::size_t> findColumn(std::string_view header, std::string_view 
     return std::nullopt;
 }
 
+/// Whether a simulator writes a value of unknown bits so: as x, or with digits of x or z, "xxx", "0x7x", "zz01".
+bool isUnknown(std::string_view text, NumberForm form)
+{
+    text.remove_prefix(text.substr(0, 2) == "0x" && form != NumberForm::binary ? 2 : 0);
+    return text.find_first_of("xXzZ") != std::string_view::npos &&
+           text.find_first_not_of("xXzZ0123456789abcdefABCDEF") == std::string_view::npos;
+}
+
 /// Reads rows of a value each, which name the signal, or rows with a column for each signal.
 class CsvReader {
 public:
@@ -126,8 +134,8 @@ private:
 
     void take(std::string_view name, unsigned signal, std::string_view text)
     {
-        if (text.empty() || text == "x" || text == "X") {
-            return;  // unknown
+        if (text.empty() || isUnknown(text, itsMap.numbers)) {
+            return;
         }
         const std::string_view row = itsFile.line();
         const Place place = {

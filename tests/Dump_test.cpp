@@ -91,6 +91,17 @@ TEST(CsvDump, ReadsEachFormOfNumbers)
     EXPECT_EQ(value(R"("numbers": "binary")", "100000000000"), -2048);
 }
 
+TEST(CsvDump, LeavesOutWhatIsUnknown)
+{
+    for (const char* const text : {"", " ", "x", "X", "xxx", "zzzzzzzz", "0xxxx", "0x7x", "0Z1", "fX"}) {
+        const Dump dump = read(readCsv, header + "0,0,llr," + text + "\n0,0,alpha3,1\n");
+        EXPECT_FALSE(dump.values.has({0, llr, 0})) << text;
+        EXPECT_TRUE(dump.values.has({0, alpha3, 0})) << text;
+    }
+    const Dump dump = read(readCsv, header + "0,0,llr,0x0000000000\n", mapOf(R"({"numbers": "binary"})"));
+    EXPECT_FALSE(dump.values.has({0, llr, 0}));
+}
+
 TEST(CsvDump, TakesTheNamesOfAMap)
 {
     const NameMap map = mapOf(R"({"columns": {"half_iteration": "pass", "step": "k", "signal": "net", "value": "v"},
@@ -118,6 +129,8 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
     expectRefused(readCsv, header + "0,0,llr,2048\n", R"(dump:2: llr "2048")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,0.1\n", R"(dump:2: llr "0.1")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,q\n", R"(dump:2: llr "q")" + numbers);
+    expectRefused(readCsv, header + "0,0,llr,max\n", R"(dump:2: llr "max")" + numbers);
+    expectRefused(readCsv, header + "0,0,llr,0x\n", R"(dump:2: llr "0x")" + numbers);
     expectRefused(readCsv,
                   header + "0,0,llr,1\n0,0,llr,1\n",
                   "dump:3: llr of this half-iteration and step stands in line 2, too");
