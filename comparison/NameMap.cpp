@@ -6,7 +6,6 @@
 #include <charconv>
 #include <cmath>
 #include <nlohmann/json.hpp>
-#include <sstream>
 #include <system_error>
 #include <utility>
 
@@ -167,6 +166,20 @@ private:
     std::string itsName;
 };
 
+/// Tells where a text is no JSON: nlohmann counts bytes from the beginning, and one more at the end.
+Json parse(const std::string& text, const std::string& name)
+{
+    try {
+        return Json::parse(text);
+    } catch (const Json::parse_error& error) {
+        const std::string before = text.substr(0, std::max(error.byte, std::size_t{1}) - 1);
+        const auto line = std::count(before.begin(), before.end(), '\n') + 1;
+        const std::size_t character = before.size() - (before.rfind('\n') + 1) + 1;
+        throw simulation::Error(name + ':' + std::to_string(line) + ": no JSON, character " +
+                                std::to_string(character) + " is not expected there");
+    }
+}
+
 }  // namespace
 
 NameMap::NameMap()
@@ -229,9 +242,14 @@ std::string NameMap::expectedNumber() const
 
 NameMap readNameMap(std::istream& input, const std::string& name)
 {
-    std::ostringstream text;
-    text << input.rdbuf();
-    const Json object = Json::parse(text.str(), nullptr, false);
+    std::string text;
+    for (std::string line; std::getline(input, line);) {
+        text += line + '\n';
+    }
+    if (input.bad()) {
+        throw simulation::fileError(name, "read");
+    }
+    const Json object = parse(text, name);
     if (!object.is_object()) {
         throw simulation::Error(name + ": no map, expected a JSON object");
     }

@@ -143,7 +143,8 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
 TEST(NameMap, NamesWhatIsWrong)
 {
     expectMapRefused("[]", "map.json: no map, expected a JSON object");
-    expectMapRefused("{", "map.json: no map, expected a JSON object");
+    expectMapRefused("{", "map.json:2: no JSON, character 1 is not expected there");
+    expectMapRefused("{\"bits\": 16,\n \"valid\" \"on\"}", "map.json:2: no JSON, character 13 is not expected there");
     expectMapRefused(R"({"signal": {}})",
                      "map.json: \"signal\" is no key of a map, allowed are columns, signals, numbers, bits, "
                      "first_half_iteration, first_step, valid");

@@ -230,6 +230,7 @@ TEST_F(Compare, NamesBadFiles)
     const std::string good = morvik.read("rtl.csv");
     expectRefused(compare({"--block-number", "1"}), "block.csv: has 1 block, there is no block 1");
     expectRefused(compare({"--map", "none.json"}), "none.json: cannot be opened: No such file or directory");
+    expectRefused(compare({"--map", "."}), ".: cannot be read: Is a directory");
     morvik.write("rtl.csv", withLine(good, 9, "0,0,alpha3,2048"));
     expectRefused(compare(),
                   "rtl.csv:9: alpha3 \"2048\" is not allowed, expected an integer from -2048 to 2047, or a multiple of "
