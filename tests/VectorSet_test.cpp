@@ -311,6 +311,11 @@ TEST_F(VectorSet, RefusesAManifestThatIsNone)
             expectRefused(path() + "/manifest.json: " + what);
         };
     expectManifestRefused("\"iterations\": 2", "\"iterations\": 16", "iterations 16 is not allowed");
+    expectManifestRefused("\"iterations\": 2", "\"iterations\": 2.5", "iterations 2.5 is not allowed");
+    expectManifestRefused("\"iterations\": 2", "\"iterations\": 1e30", "iterations 1e+30 is not allowed");
+    expectManifestRefused("\"tag\": 1", "\"tag\": -1", "tag -1 is not allowed");
+    expectManifestRefused("\"tag\": 1", "\"tag\": 3", "has another size or tag of block 1 than csv");
+    expectManifestRefused("\"block_size\": 40", "\"block_size\": 48", "has another size or tag of block 0 than csv");
     expectManifestRefused("\"width\": 8", "\"width\": 12", "width 12 is not allowed");
     expectManifestRefused("\"scaled\"", "\"best\"", "algorithm \"best\" is not allowed");
     expectManifestRefused("\"name\": \"csv\"", "\"name\": \"xls\"", "format \"xls\" is not known");
@@ -337,6 +342,9 @@ TEST_F(VectorSet, RefusesAnotherNumberOfBlocksThanTheManifestNames)
     other.blocks.push_back(other.blocks.back());
     folder.write("set/manifest.json", manifestText(other));
     expectRefused(path() + "/manifest.json: names more blocks than csv has");
+    other.formats.clear();
+    folder.write("set/manifest.json", manifestText(other));
+    expectRefused(path() + "/manifest.json: names no format");
 }
 
 TEST(Checksum, IsThatOfTheStandard)

@@ -55,15 +55,22 @@ Json formatOf(const ManifestFormat& format)
     return {{"name", format.name}, {"files", files}, {"tables", tables}};
 }
 
-/// An integer of the parameters that has to lie within bounds.
+/// An integer that has to lie within bounds.
 template <class Integer>
 Integer bounded(const Json& json, const char* name, Integer lowest, Integer highest)
 {
-    const auto value = json.at(name).get<std::int64_t>();
+    const Json& member = json.at(name);
+    const auto value = member.is_number_integer() ? member.get<std::int64_t>() : -1;
     if (value < static_cast<std::int64_t>(lowest) || value > static_cast<std::int64_t>(highest)) {
-        throw simulation::Error(std::string(name) + ' ' + std::to_string(value) + " is not allowed");
+        throw simulation::Error(std::string(name) + ' ' + member.dump() + " is not allowed");
     }
     return static_cast<Integer>(value);
+}
+
+/// The value of a member that is no larger than 32 bits hold.
+std::uint32_t word(const Json& json, const char* name)
+{
+    return bounded(json, name, std::uint32_t{0}, UINT32_MAX);
 }
 
 /// What the check of a set needs to know. Whatever the core refuses is left to it.
@@ -127,9 +134,12 @@ Manifest manifestFrom(const Json& json)
     }
     for (const Json& block : json.at("blocks")) {
         manifest.blocks.push_back({block.at("name").get<std::string>(),
-                                   block.at("block_size").get<std::uint32_t>(),
-                                   block.at("tag").get<std::uint32_t>(),
-                                   block.at("expected_tag").get<std::uint32_t>()});
+                                   word(block, "block_size"),
+                                   word(block, "tag"),
+                                   word(block, "expected_tag")});
+    }
+    if (manifest.formats.empty()) {
+        throw simulation::Error("names no format");
     }
     return manifest;
 }

@@ -105,6 +105,11 @@ std::optional<std::string> differenceOf(const Expected& got, const Expected& wan
     return differenceOf(got.internal, wanted.internal);
 }
 
+bool isNamed(const Stimulus& stimulus, const Expected& expected, const ManifestBlock& named)
+{
+    return stimulus.K == named.K && stimulus.tag == named.tag && expected.tag == named.expectedTag;
+}
+
 /// Checks one format; the first difference.
 std::optional<std::string> checkFormat(const std::string& folder,
                                        const Manifest& manifest,
@@ -128,6 +133,10 @@ std::optional<std::string> checkFormat(const std::string& folder,
         if (const auto difference = differenceOf(core.expect(stimulus), expected)) {
             return format.name + ", block " + std::to_string(number) + " (" + manifest.blocks[number].name +
                    ", K = " + std::to_string(stimulus.K) + "): " + *difference;
+        }
+        if (!isNamed(stimulus, expected, manifest.blocks[number])) {
+            throw simulation::Error(manifestIn(folder) + ": has another size or tag of block " +
+                                    std::to_string(number) + " than " + format.name);
         }
     }
     if (number < manifest.blocks.size()) {
