@@ -52,7 +52,8 @@ unsigned DumpFile::count(const std::string& what, std::string_view text, unsigne
     const auto result = std::from_chars(text.data(), end, value);
     if (result.ec != std::errc() || result.ptr != end || value < first || value - first >= count) {
         fail(what + ' ' + simulation::shown(text) + " is not allowed, allowed are the integers " +
-             std::to_string(first) + " to " + std::to_string(first + count - 1));
+             std::to_string(first) + " to " + std::to_string(first + count - 1) +
+             (first == 0 && value == count ? "; a map tells when they count from 1" : ""));
     }
     return value - first;
 }

@@ -327,6 +327,10 @@ std::optional<std::string> findShift(const Model& model, const Values& dump)
     if (agrees(0, 1)) {
         return "the dump is a step late, or counts steps from 1; \"first_step\": 1 in a map says so";
     }
+    if (agrees(1, 1)) {
+        return "the dump counts half-iterations and steps from 1; \"first_half_iteration\": 1 and \"first_step\": 1 in "
+               "a map say so";
+    }
     return std::nullopt;
 }
 

@@ -121,11 +121,17 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
     expectRefused(readCsv,
                   header + "0,0,LLR,1\n",
                   R"(dump:2: signal "LLR" is not known; a map tells which it is, or that it does not count)");
-    expectRefused(readCsv,
-                  header + "2,0,llr,1\n",
-                  R"(dump:2: half-iteration "2" is not allowed, allowed are the integers 0 to 1)");
     expectRefused(
-        readCsv, header + "0,43,llr,1\n", R"(dump:2: step "43" is not allowed, allowed are the integers 0 to 42)");
+        readCsv,
+        header + "2,0,llr,1\n",
+        R"(dump:2: half-iteration "2" is not allowed, allowed are the integers 0 to 1; a map tells when they count from 1)");
+    expectRefused(readCsv,
+                  header + "3,0,llr,1\n",
+                  R"(dump:2: half-iteration "3" is not allowed, allowed are the integers 0 to 1)");
+    expectRefused(
+        readCsv,
+        header + "0,43,llr,1\n",
+        R"(dump:2: step "43" is not allowed, allowed are the integers 0 to 42; a map tells when they count from 1)");
     expectRefused(readCsv, header + "0,0,llr,2048\n", R"(dump:2: llr "2048")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,0.1\n", R"(dump:2: llr "0.1")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,q\n", R"(dump:2: llr "q")" + numbers);
