@@ -33,12 +33,13 @@ struct NamedMistake {
     const char* text;
 };
 
-constexpr std::array<NamedMistake, 14> namedMistakes = {{
+constexpr std::array<NamedMistake, 15> namedMistakes = {{
     {Mistake::borderBitsKept, "the seven low bits of border metrics are not cleared (rule 11)"},
     {Mistake::borderOfOtherPass,
      "border metrics are those of the other pass: this one's for the last one's, or the reverse (rule 20)"},
     {Mistake::borderUnknown, "start metrics are zeros, as for an unknown state (rule 10)"},
     {Mistake::aprioriMissing, "the extrinsic values of the pass before do not arrive (rule 13)"},
+    {Mistake::aprioriOfPassBefore, "a pass late: extrinsic values are those of the pass before the last (rule 13)"},
     {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
     {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
     {Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"},
@@ -96,6 +97,11 @@ private:
         consider("the sign is flipped", faults, finding, [](const Fault& fault) {
             return fault.got == -fault.wanted || fault.got == ~fault.wanted;
         });
+        consider(
+            "the wrap is missing: values stay at the end of the range (rule 2)",
+            faults,
+            finding,
+            [](const Fault& fault) { return fault.got == (fault.wanted < 0 ? Values::largest : Values::smallest); });
         consider("zeros", faults, finding, [](const Fault& fault) { return fault.got == 0; });
         consider("values of the step before", faults, finding, [this](const Fault& fault) {
             return isOfOtherStep(fault, -1);

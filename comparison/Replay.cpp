@@ -146,9 +146,10 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
     const Code& code = itsModel.codes[d];
     const bool isTail = trellisStep >= itsModel.windows.K;
     int apriori = 0;
-    if (!isTail && pass > 0 && mistake != Mistake::aprioriMissing) {
+    const unsigned back = mistake == Mistake::aprioriOfPassBefore ? 2 : 1;
+    if (!isTail && pass >= back && mistake != Mistake::aprioriMissing) {
         const unsigned from = mistake == Mistake::aprioriUnpermuted ? trellisStep : code.order[trellisStep];
-        apriori = input({pass - 1, signalsOf(Stage::extrinsic).first, from}, complete);
+        apriori = input({pass - back, signalsOf(Stage::extrinsic).first, from}, complete);
     }
     const bool unpermuted = mistake == Mistake::systematicUnpermuted && !isTail;
     const int systematic = (unpermuted ? itsModel.codes[1 - d] : code).systematic[trellisStep];

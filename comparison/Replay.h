@@ -15,6 +15,7 @@ namespace morvik::comparison {
 enum class Mistake : std::uint8_t {
     none,
     aprioriMissing,        ///< intrinsic values from the systematic ones alone
+    aprioriOfPassBefore,   ///< extrinsic values of the pass before the last one
     aprioriUnpermuted,     ///< extrinsic values in the order of the other code
     systematicUnpermuted,  ///< systematic values in the natural order, on the interleaved code
     parityOfOtherCode,

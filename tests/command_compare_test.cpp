@@ -144,7 +144,10 @@ INSTANTIATE_TEST_SUITE_P(
         FaultCase{"branch_eight_bits", 512, 2, 1, 0, branch, "saturation is missing: the sum is cut", 80},
         FaultCase{"extrinsic_unclipped", 512, 2, 1, 0, extrinsic, "saturation is missing: the sum is wider", 80},
         FaultCase{"metrics_unwrapped", 512, 2, 1, 0, forward, "the wrap is missing", 80},
+        FaultCase{"ratio_unwrapped", 512, 2, 1, 0, ratio, "the wrap is missing: values stay at the end", 48},
         FaultCase{"apriori_late", 512, 2, 1, 1, intrinsic, "a pass late: values are those of the last pass"},
+        FaultCase{
+            "apriori_before", 512, 2, 1, 1, intrinsic, "a pass late: extrinsic values are those of the pass before"},
         FaultCase{"apriori_missing", 512, 2, 1, 1, intrinsic, "of the pass before do not arrive"},
         FaultCase{"apriori_unpermuted", 512, 2, 1, 1, intrinsic, "without the interleaver's permutation"},
         FaultCase{"systematic_unpermuted", 512, 2, 1, 0, intrinsic, "in the other code's order"},

@@ -33,6 +33,12 @@ FAULTS = {
          "    static std::vector<std::vector<short>> held;\n"
          "    held.resize(h);\n    held.push_back(itsExtrinsic);\n    for"),
         ("j < K ? itsExtrinsic[from[j]] : 0", "j < K && h >= 2 ? held[h - 2][from[j]] : 0")]),
+    "apriori_before": (DECODER, DECODER, [
+        ("    const int mask = itsEngine->itsStateFormat->itsMask;\n    for",
+         "    const int mask = itsEngine->itsStateFormat->itsMask;\n"
+         "    static std::vector<std::vector<short>> held;\n"
+         "    held.resize(h);\n    held.push_back(itsExtrinsic);\n    for"),
+        ("j < K ? itsExtrinsic[from[j]] : 0", "j < K && h >= 1 ? held[h - 1][from[j]] : 0")]),
     "apriori_missing": (DECODER, DECODER, [("j < K ? itsExtrinsic[from[j]] : 0", "from[j % K] > K ? 1 : 0")]),
     "apriori_unpermuted": (DECODER, DECODER, [("j < K ? itsExtrinsic[from[j]]", "j < K && from[j] < K ? itsExtrinsic[j]")]),
     "systematic_unpermuted": (DECODER, DECODER, [("itsSys[0][itsInterleaver->itsPi[i]]", "itsSys[0][i]")]),
@@ -54,6 +60,10 @@ FAULTS = {
         ("return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));",
          "return static_cast<Value>(subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g)) + "
          "16 * (a[0] & 16 ? 1 : 0));")]),
+    "ratio_unwrapped": (ENGINE, "Trellis.h", [
+        ("return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));",
+         "const int ratio = bestPath<1>(rule, a, b, g) - bestPath<0>(rule, a, b, g);\n"
+         "    return static_cast<Value>(ratio < -32768 ? -32768 : ratio > 32752 ? 32752 : ratio);")]),
     "tail_sign": (SEGMENTS, "Trellis.h", [("{-e2 - e1 - g0,", "{-e2 - e1 + g0,")]),
     "tail_bits_kept": (SEGMENTS, SEGMENTS, [("    *column = border(*column);\n", "")]),
     "forward_bits_kept": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);", "starts[u] = reached;")]),
