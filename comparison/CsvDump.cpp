@@ -142,7 +142,7 @@ private:
             itsFile.count("half-iteration", field(row, itsPass), itsMap.firstPass, itsDump.values.passes()),
             signal,
             itsFile.count("step", field(row, itsStep), itsMap.firstStep, itsDump.values.steps())};
-        const std::int16_t value = itsFile.value(name, text, itsMap);
+        const std::int16_t value = itsFile.value(name, signal, text, itsMap);
         if (itsDump.values.has(place)) {
             itsFile.fail(std::string(name) + " of this half-iteration and step stands in line " +
                          std::to_string(itsDump.lineOf(place)) + ", too");

@@ -36,7 +36,8 @@ struct Dump {
 
 /// Reads CSV: a header with the columns half_iteration, step, signal and value in any order, or, for the last two, a
 /// column for each signal; the map may call them otherwise, and other columns are left alone. An empty value, or one
-/// with digits of x or z, is not known and does not count. What is wrong is thrown as a simulation::Error that opens with the place.
+/// with digits of x or z, is not known and does not count. What is wrong is thrown as a simulation::Error that opens
+/// with the place.
 void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
 /// Reads a value change dump. In each scope with signals, half_iteration and step (in the scope or one around it) tell

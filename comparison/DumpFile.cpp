@@ -58,11 +58,12 @@ unsigned DumpFile::count(const std::string& what, std::string_view text, unsigne
     return value - first;
 }
 
-std::int16_t DumpFile::value(std::string_view signal, std::string_view text, const NameMap& map) const
+std::int16_t DumpFile::value(std::string_view name, unsigned signal, std::string_view text, const NameMap& map) const
 {
-    const auto value = map.number(text);
+    const auto value = map.number(text, signal);
     if (!value || *value < Values::smallest || *value > Values::largest) {
-        fail(std::string(signal) + ' ' + simulation::shown(text) + " is not allowed, expected " + map.expectedNumber());
+        fail(std::string(name) + ' ' + simulation::shown(text) + " is not allowed, expected " +
+             map.expectedNumber(signal));
     }
     return static_cast<std::int16_t>(*value);
 }

@@ -31,8 +31,8 @@ public:
     /// A number that counts from `first`, brought to 0 to `count` - 1.
     unsigned count(const std::string& what, std::string_view text, unsigned first, unsigned count) const;
 
-    /// A value of the signal, as the map says it is written.
-    std::int16_t value(std::string_view signal, std::string_view text, const NameMap& map) const;
+    /// A value of the signal, as the map says it is written; the dump calls it `name`.
+    std::int16_t value(std::string_view name, unsigned signal, std::string_view text, const NameMap& map) const;
 
 private:
     std::istream& itsInput;

@@ -27,6 +27,8 @@ constexpr std::array<std::pair<const char*, NumberForm>, 6> numberForms = {{{"au
                                                                             {"hex", NumberForm::hexadecimal},
                                                                             {"binary", NumberForm::binary}}};
 
+constexpr char signalNames[] = "intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic";
+
 std::optional<std::int64_t> integer(std::string_view text, int base)
 {
     std::int64_t value = 0;
@@ -86,7 +88,7 @@ private:
         } else if (key == "numbers") {
             map.numbers = numberForm(value);
         } else if (key == "bits") {
-            map.bits = count(key, value, 12, 32);
+            readBits(value, map);
         } else if (key == "first_half_iteration") {
             map.firstPass = count(key, value, 0, 1);
         } else if (key == "first_step") {
@@ -127,20 +129,42 @@ private:
         fail("\"numbers\" is " + value.dump() + ", allowed are auto, integer, unsigned, real, hex, binary");
     }
 
+    static std::optional<unsigned> signalOf(const Json& name)
+    {
+        const auto* const found =
+            std::find_if(passSignals.begin(), passSignals.end(), [&](const char* each) { return name == each; });
+        return found == passSignals.end() ? std::nullopt
+                                          : std::optional<unsigned>(static_cast<unsigned>(found - passSignals.begin()));
+    }
+
+    void readBits(const Json& value, NameMap& map) const
+    {
+        constexpr unsigned fewest = 8;
+        constexpr unsigned most = 32;
+        if (!value.is_object()) {
+            map.bits.fill(count("bits", value, fewest, most));
+            return;
+        }
+        for (const auto& [name, bits] : value.items()) {
+            const auto signal = signalOf(name);
+            if (!signal) {
+                fail("bits of " + shown(name) + std::string(", allowed are ") + signalNames);
+            }
+            map.bits[*signal] = count(name, bits, fewest, most);
+        }
+    }
+
     void readSignals(const Json& value, NameMap& map) const
     {
         if (!value.is_object()) {
             fail("\"signals\" is no object");
         }
         for (const auto& [theirs, ours] : value.items()) {
-            const auto* const found = std::find_if(
-                passSignals.begin(), passSignals.end(), [&own = ours](const char* each) { return own == each; });
-            if (found == passSignals.end() && !ours.is_null()) {
-                fail("signal " + shown(theirs) + " is " + ours.dump() +
-                     ", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic, and null");
+            const auto signal = signalOf(ours);
+            if (!signal && !ours.is_null()) {
+                fail("signal " + shown(theirs) + " is " + ours.dump() + ", allowed are " + signalNames + ", and null");
             }
-            map.signals[theirs] =
-                ours.is_null() ? NameMap::leftOut : static_cast<unsigned>(found - passSignals.begin());
+            map.signals[theirs] = signal.value_or(NameMap::leftOut);
         }
     }
 
@@ -182,8 +206,10 @@ Json parse(const std::string& text, const std::string& name)
 
 }  // namespace
 
-NameMap::NameMap()
+NameMap::NameMap() : bits()
 {
+    constexpr unsigned metricBits = 12;
+    bits.fill(metricBits);
     for (unsigned i = 0; i < signalCount; ++i) {
         signals[passSignals[i]] = i;
     }
@@ -195,35 +221,36 @@ std::optional<unsigned> NameMap::signal(std::string_view name) const
     return found == signals.end() ? std::nullopt : std::optional<unsigned>(found->second);
 }
 
-std::optional<std::int64_t> NameMap::number(std::string_view text) const
+std::optional<std::int64_t> NameMap::number(std::string_view text, unsigned signal) const
 {
+    const unsigned width = bits[signal];
     const bool isHexadecimal = text.substr(0, 2) == "0x" || text.substr(0, 2) == "0X";
-    if (!text.empty() && text[0] == '+') {
+    if (text.size() > 1 && text[0] == '+' && text[1] != '-') {
         text.remove_prefix(1);  // which from_chars() does not take
     }
     switch (numbers) {
     case NumberForm::integer:
         return integer(text, 10);
     case NumberForm::unsignedInteger:
-        return complement(integer(text, 10), bits);
+        return complement(integer(text, 10), width);
     case NumberForm::real:
         return eighths(text);
     case NumberForm::hexadecimal:
-        return complement(integer(isHexadecimal ? text.substr(2) : text, 16), bits);
+        return complement(integer(isHexadecimal ? text.substr(2) : text, 16), width);
     case NumberForm::binary:
-        return complement(integer(text, 2), bits);
+        return complement(integer(text, 2), width);
     default:
         break;
     }
     if (isHexadecimal) {
-        return complement(integer(text.substr(2), 16), bits);
+        return complement(integer(text.substr(2), 16), width);
     }
     return text.find('.') == std::string_view::npos ? integer(text, 10) : eighths(text);
 }
 
-std::string NameMap::expectedNumber() const
+std::string NameMap::expectedNumber(unsigned signal) const
 {
-    const std::string width = std::to_string(bits);
+    const std::string width = std::to_string(bits[signal]);
     switch (numbers) {
     case NumberForm::unsignedInteger:
         return "an unsigned integer of " + width + " bits";

@@ -2,12 +2,15 @@
 #ifndef MORVIK_COMPARISON_NAMEMAP_H
 #define MORVIK_COMPARISON_NAMEMAP_H
 
+#include <array>
 #include <cstdint>
 #include <istream>
 #include <map>
 #include <optional>
 #include <string>
 #include <string_view>
+
+#include "testbench/Passes.h"
 
 namespace morvik::comparison {
 
@@ -25,7 +28,7 @@ enum class NumberForm : std::uint8_t {
 ///   "columns"   of CSV, or variables of VCD: {"half_iteration": NAME, "step": NAME, "signal": NAME, "value": NAME}
 ///   "signals"   {NAME: SIGNAL or null, ...}: SIGNAL is one of passSignals; null leaves the signal out
 ///   "numbers"   auto, integer, unsigned, real, hex or binary
-///   "bits"      of a number in two's complement, 12 when left out
+///   "bits"      of a number in two's complement, 12 when left out; or {SIGNAL: bits, ...}
 ///   "first_half_iteration", "first_step"   what the dump counts from, 0 when left out
 ///   "valid"     of VCD: a variable that is 1 when the values of its scope count
 struct NameMap {
@@ -38,7 +41,7 @@ struct NameMap {
     std::string valueColumn = "value";
     std::map<std::string, unsigned, std::less<>> signals;  ///< to places in passSignals, or leftOut
     NumberForm numbers = NumberForm::automatic;
-    unsigned bits = 12;
+    std::array<unsigned, passSignals.size()> bits;
     unsigned firstPass = 0;
     unsigned firstStep = 0;
     std::string valid;
@@ -49,11 +52,12 @@ struct NameMap {
     /// The signal that a dump calls so.
     std::optional<unsigned> signal(std::string_view name) const;
 
-    /// The value in eighths that a text stands for; nothing when it is no number of the form. It may be out of range.
-    std::optional<std::int64_t> number(std::string_view text) const;
+    /// The value in eighths that a text stands for as one of the signal; nothing when it is no number of the form. It
+    /// may be out of range.
+    std::optional<std::int64_t> number(std::string_view text, unsigned signal) const;
 
     /// What number() expects, for messages.
-    std::string expectedNumber() const;
+    std::string expectedNumber(unsigned signal) const;
 };
 
 /// Throws a simulation::Error that opens with the file.

@@ -303,10 +303,10 @@ private:
         NameMap reals;
         reals.numbers = NumberForm::real;
         const bool inEighths = variable.role == Role::signal;
-        const auto value = reals.number(digits);
+        const auto value = reals.number(digits, variable.signal);
         if (!value || (!inEighths && *value % 8 != 0)) {
             itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected " +
-                         (inEighths ? reals.expectedNumber() : "an integer"));
+                         (inEighths ? reals.expectedNumber(variable.signal) : "an integer"));
         }
         return inEighths ? *value : *value / 8;
     }

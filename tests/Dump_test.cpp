@@ -89,6 +89,9 @@ TEST(CsvDump, ReadsEachFormOfNumbers)
     EXPECT_EQ(value(R"("numbers": "hex")", "800"), -2048);
     EXPECT_EQ(value(R"("numbers": "hex", "bits": 16)", "ffff"), -1);
     EXPECT_EQ(value(R"("numbers": "binary")", "100000000000"), -2048);
+    EXPECT_EQ(value(R"("numbers": "hex", "bits": 8)", "f7"), -9);
+    EXPECT_EQ(value(R"("numbers": "hex", "bits": {"llr": 8})", "f7"), -9);
+    EXPECT_EQ(value(R"("numbers": "hex", "bits": {"extrinsic": 8})", "0f7"), 247);
 }
 
 TEST(CsvDump, LeavesOutWhatIsUnknown)
@@ -135,6 +138,7 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
     expectRefused(readCsv, header + "0,0,llr,2048\n", R"(dump:2: llr "2048")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,0.1\n", R"(dump:2: llr "0.1")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,q\n", R"(dump:2: llr "q")" + numbers);
+    expectRefused(readCsv, header + "0,0,llr,+-1\n", R"(dump:2: llr "+-1")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,max\n", R"(dump:2: llr "max")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,0x\n", R"(dump:2: llr "0x")" + numbers);
     expectRefused(readCsv,
@@ -164,7 +168,11 @@ TEST(NameMap, NamesWhatIsWrong)
     expectMapRefused(R"({"columns": {"step": 1}})", "map.json: \"step\" is no text");
     expectMapRefused(R"({"numbers": "octal"})",
                      "map.json: \"numbers\" is \"octal\", allowed are auto, integer, unsigned, real, hex, binary");
-    expectMapRefused(R"({"bits": 64})", "map.json: \"bits\" is 64, allowed are the integers 12 to 32");
+    expectMapRefused(R"({"bits": 64})", "map.json: \"bits\" is 64, allowed are the integers 8 to 32");
+    expectMapRefused(R"({"bits": {"g0": 7}})", "map.json: \"g0\" is 7, allowed are the integers 8 to 32");
+    expectMapRefused(R"({"bits": {"g": 8}})",
+                     "map.json: bits of \"g\", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, "
+                     "extrinsic");
 }
 
 /// Two units, of which the second is idle at first; the counters are those of the core.
