@@ -62,7 +62,7 @@ public:
         if (!itsFile.next()) {
             itsFile.fail("no header, expected the columns half_iteration, step, signal, value");
         }
-        readHeader();
+        readHeader(withoutMark(itsFile.line()));
         while (itsFile.next()) {
             if (!itsFile.line().empty()) {
                 readRow();
@@ -77,15 +77,22 @@ private:
         std::size_t column;
     };
 
-    void readHeader()
+    /// UTF-8 may open with a byte order mark, as spreadsheets write it.
+    static std::string_view withoutMark(std::string_view line)
     {
-        const std::string_view header = itsFile.line();
-        itsPass = needColumn(itsMap.passColumn);
-        itsStep = needColumn(itsMap.stepColumn);
+        constexpr std::string_view mark = "\xEF\xBB\xBF";
+        line.remove_prefix(line.substr(0, mark.size()) == mark ? mark.size() : 0);
+        return line;
+    }
+
+    void readHeader(std::string_view header)
+    {
+        itsPass = needColumn(header, itsMap.passColumn);
+        itsStep = needColumn(header, itsMap.stepColumn);
         itsFields = fieldsOf(header);
         itsSignal = findColumn(header, itsMap.signalColumn);
         if (itsSignal) {
-            itsValue = needColumn(itsMap.valueColumn);
+            itsValue = needColumn(header, itsMap.valueColumn);
             return;
         }
         for (std::size_t i = 0; i < itsFields; ++i) {
@@ -96,15 +103,15 @@ private:
             }
         }
         if (itsColumns.empty()) {
-            needColumn(itsMap.signalColumn);
+            needColumn(header, itsMap.signalColumn);
         }
     }
 
-    std::size_t needColumn(const std::string& name) const
+    std::size_t needColumn(std::string_view header, const std::string& name) const
     {
-        const auto found = findColumn(itsFile.line(), name);
+        const auto found = findColumn(header, name);
         if (!found) {
-            itsFile.fail("no column " + shown(name) + " in the header " + shown(itsFile.line()));
+            itsFile.fail("no column " + shown(name) + " in the header " + shown(header));
         }
         return *found;
     }

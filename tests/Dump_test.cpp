@@ -64,6 +64,12 @@ TEST(CsvDump, ReadsValuesInAnyOrderOfRowsAndColumns)
     EXPECT_FALSE(dump.values.has({0, llr, 7}));
 }
 
+TEST(CsvDump, ReadsWhatASpreadsheetWrites)
+{
+    const Dump dump = read(readCsv, "\xEF\xBB\xBFhalf_iteration,step,signal,value\r\n0,0,llr,5\r\n");
+    EXPECT_EQ(dump.values.at({0, llr, 0}), 5);
+}
+
 TEST(CsvDump, ReadsAColumnForEachSignal)
 {
     const Dump dump = read(readCsv, "block,half_iteration,step,unit,alpha3,llr\n0,1,7,0,-5,x\n0,0,0,0,,6\n");
