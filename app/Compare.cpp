@@ -74,7 +74,7 @@ int compare(const Options& options)
     const SoftBlock block = readBlock(options.block, options.number);
     const comparison::NameMap map = readMap(options.map);
     const comparison::Model model =
-        comparison::computeModel(block, options.decoder.generics, options.decoder.iterations);
+        comparison::computeModel(block, options.decoder.generics, options.decoder.iterations, std::cerr);
     comparison::Dump dump(model.values.passes(), model.values.steps());
     InputFile input(options.dump);
     (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);

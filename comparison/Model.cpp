@@ -2,7 +2,6 @@
 #include "Model.h"
 
 #include <cstddef>
-#include <sstream>
 #include <utility>
 
 #include "src/TDecoder3GPU.h"
@@ -41,9 +40,11 @@ void keepPass(const Passes& passes, unsigned pass, Values& values)
 
 }  // namespace
 
-Model computeModel(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, unsigned iterations)
+Model computeModel(const SoftBlock& block,
+                   const veltra_ip_morvik_v1_0_generics& generics,
+                   unsigned iterations,
+                   std::ostream& warnings)
 {
-    std::ostringstream warnings;
     Passes passes(block, generics, warnings);
     Values values(2 * iterations, passes.division().K() + tailSteps);
     for (unsigned pass = 0; pass < values.passes(); ++pass) {

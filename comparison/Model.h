@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <ostream>
 #include <vector>
 
 #include "Values.h"
@@ -56,8 +57,11 @@ struct Model {
     std::array<Code, 2> codes;
 };
 
-/// Decodes the block. Throws Refusal when the library refuses.
-Model computeModel(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, unsigned iterations);
+/// Decodes the block; the library's warnings go to the stream. Throws Refusal when the library refuses.
+Model computeModel(const SoftBlock& block,
+                   const veltra_ip_morvik_v1_0_generics& generics,
+                   unsigned iterations,
+                   std::ostream& warnings);
 
 /// The steps of a stage in the order in which the core computes them: the segments at the same time, the backward
 /// recursion window by window from its end.

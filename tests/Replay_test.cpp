@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <iostream>
 #include <string>
 
 #include "comparison/Comparison.h"
@@ -25,7 +26,7 @@ Model modelOf(unsigned K, int units, int algorithm, unsigned iterations, unsigne
     auto generics = veltra_ip_morvik_v1_0_get_default_generics();
     generics.C_NUM_PU = units;
     generics.C_ALGORITHM_TYPE = algorithm;
-    return computeModel(noisyBlock(K, seed), generics, iterations);
+    return computeModel(noisyBlock(K, seed), generics, iterations, std::cerr);
 }
 
 /// Sizes of one segment and of several, with one, two, three and more windows in each.

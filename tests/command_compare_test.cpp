@@ -240,6 +240,15 @@ TEST_F(Compare, TellsThatADumpCountsInAnotherWay)
     EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
 }
 
+TEST_F(Compare, PassesOnTheWarningsOfTheModel)
+{
+    morvik.write("block.csv", header + "\n0,200,0,0\n" + zeroRows("0", 43));
+    morvik.write("rtl.csv", "half_iteration,step,signal,value\n0,0,intrinsic,63\n");
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 0) << result.out;
+    EXPECT_TRUE(has(result.err, "WARNING:")) << result.err;
+}
+
 TEST_F(Compare, NamesBadFiles)
 {
     writeBlock(40);

@@ -60,6 +60,6 @@ int main(int argc, char** argv)
     veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
     generics.C_NUM_PU = std::atoi(argv[1]);
     generics.C_ALGORITHM_TYPE = std::atoi(argv[2]);
-    write(computeModel(readBlock(std::cin), generics, static_cast<unsigned>(std::atoi(argv[3]))).values);
+    write(computeModel(readBlock(std::cin), generics, static_cast<unsigned>(std::atoi(argv[3])), std::cerr).values);
     return 0;
 }
