@@ -6,13 +6,13 @@
 
 #include "simulation/Error.h"
 #include "standard/BlockSizes.h"
+#include "testbench/Division.h"
 #include "testbench/SoftBlock.h"
 
 namespace morvik::vectors {
 
 namespace {
 
-constexpr std::uint32_t tailSteps = 3;
 constexpr unsigned metricBits = 12;
 
 /// The streams as `morvik decode` names them.
