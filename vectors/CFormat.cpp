@@ -119,9 +119,7 @@ public:
             itsFile.fail("row " + simulation::shown(itsFile.line()) + ", expected " +
                          std::to_string(itsTable.columns.size()) + " decimal integers as they were written");
         }
-        for (std::size_t i = 0; i < row.size(); ++i) {
-            checkFits(row[i], itsTable.columns[i], place());
-        }
+        checkFits(row, itsTable, *this);
         return true;
     }
 

@@ -78,9 +78,7 @@ public:
             itsFile.fail("row " + simulation::shown(itsFile.line()) + ", expected " + std::to_string(row.size() + 1) +
                          " decimal integers with commas between them");
         }
-        for (std::size_t i = 0; i < row.size(); ++i) {
-            checkFits(row[i], itsTable.columns[i], place());
-        }
+        checkFits(row, itsTable, *this);
         return true;
     }
 

@@ -48,4 +48,12 @@ void checkFits(std::int64_t value, const Column& column, const std::string& plac
     }
 }
 
+void checkFits(const Row& row, const Table& table, const TableReader& reader)
+{
+    const std::string place = reader.place();
+    for (std::size_t i = 0; i < row.size(); ++i) {
+        checkFits(row[i], table.columns[i], place);
+    }
+}
+
 }  // namespace morvik::vectors

@@ -89,8 +89,8 @@ public:
             const Column& column = itsTable.columns[i];
             end -= digitsOf(column);
             row[i] = value(std::string_view(itsFile.line()).substr(end, digitsOf(column)), column);
-            checkFits(row[i], column, place());
         }
+        checkFits(row, itsTable, *this);
         return true;
     }
 

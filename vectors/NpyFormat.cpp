@@ -108,8 +108,8 @@ public:
         row.resize(itsTable.columns.size());
         for (std::size_t i = 0; i < row.size(); ++i) {
             row[i] = number(i);
-            checkFits(row[i], itsTable.columns[i], place());
         }
+        checkFits(row, itsTable, *this);
         return true;
     }
 
