@@ -13,12 +13,11 @@
 #include <cstddef>
 #include <cstdint>
 #include <exception>
-#include <iostream>
 #include <memory>
-#include <sstream>
 #include <stdexcept>
 #include <string>
 
+#include "bindings/Listener.h"
 #include "link/TurboEncoder.h"
 #include "morvik_v1_0_batch.h"
 
@@ -27,31 +26,6 @@ namespace {
 constexpr std::size_t tailPositions = 4;
 
 enum Status : std::int32_t { success = 0, argumentRefused = 1, blockRefused = 2, outOfMemory = 99 };
-
-/// Collects what the library writes on the standard streams while it lives.
-class Listener {
-public:
-    Listener() : itsOutput(std::cout.rdbuf(&itsText)), itsError(std::cerr.rdbuf(&itsText)) {}
-
-    ~Listener()
-    {
-        std::cout.rdbuf(itsOutput);
-        std::cerr.rdbuf(itsError);
-    }
-
-    Listener(const Listener&) = delete;
-    Listener& operator=(const Listener&) = delete;
-
-    std::string text() const
-    {
-        return itsText.str();
-    }
-
-private:
-    std::stringbuf itsText;
-    std::streambuf* itsOutput;
-    std::streambuf* itsError;
-};
 
 template <class Value>
 Value* data(const mxArray* array)
@@ -132,7 +106,7 @@ std::int32_t decode(mxArray* results[], const mxArray* const* arguments, std::st
     const auto* const configuration = data<const double>(arguments[3]);
     const auto* const tags = mxIsEmpty(arguments[4]) ? nullptr : data<const std::uint32_t>(arguments[4]);
 
-    const Listener listener;
+    const morvik::Listener listener;
     const State state = createState(configuration);
     const std::int32_t status = state == nullptr
                                     ? argumentRefused

@@ -1,10 +1,10 @@
 // Session: a decoder as a simulator's test bench sees it: filled value by value, read bit by bit, its messages queued.
 #include "Session.h"
 
-#include <iostream>
 #include <mutex>
 #include <sstream>
 
+#include "bindings/Listener.h"
 #include "standard/BlockSizes.h"
 
 namespace morvik::simulator {
@@ -14,37 +14,8 @@ namespace {
 constexpr std::size_t tail = 4;
 constexpr std::size_t mostPositions = standard::blockSizes.back().K + tail;
 
-/// Collects what the library writes while it lives.
-class Listener {
-public:
-    Listener() : itsLock(mutex()), itsOutput(std::cout.rdbuf(&itsText)), itsError(std::cerr.rdbuf(&itsText)) {}
-
-    ~Listener()
-    {
-        std::cout.rdbuf(itsOutput);
-        std::cerr.rdbuf(itsError);
-    }
-
-    Listener(const Listener&) = delete;
-    Listener& operator=(const Listener&) = delete;
-
-    std::string text() const
-    {
-        return itsText.str();
-    }
-
-private:
-    static std::mutex& mutex()
-    {
-        static std::mutex one;
-        return one;
-    }
-
-    std::lock_guard<std::mutex> itsLock;
-    std::stringbuf itsText;
-    std::streambuf* itsOutput;
-    std::streambuf* itsError;
-};
+/// Held while the library is listened to: its streams are those of the process.
+std::mutex turn;
 
 /// What the library does not say: how the caller may have come to a size that no block has.
 std::string sizeHint(std::size_t positions)
@@ -68,6 +39,7 @@ Session::Session(int numPu, int algorithm, int tagWidth)
     generics.C_NUM_PU = numPu;
     generics.C_ALGORITHM_TYPE = algorithm;
     generics.C_TAG_WIDTH = tagWidth;
+    const std::lock_guard<std::mutex> lock(turn);
     const Listener listener;
     itsState = veltra_ip_morvik_v1_0_create_state(generics);
     queue(listener.text());
@@ -110,6 +82,7 @@ int Session::simulate(int iterations, std::uint32_t tag)
 {
     itsBits.resize(mostPositions);
     veltra_ip_morvik_v1_0_outputs outputs{itsBits.data(), static_cast<std::uint32_t>(itsBits.size()), 0, itsTag};
+    const std::lock_guard<std::mutex> lock(turn);
     const Listener listener;
     const int status = veltra_ip_morvik_v1_0_bitacc_simulate(itsState,
                                                              itsStreams[0].data(),
