@@ -1,49 +1,13 @@
 // DumpFile: the lines of a dump, and what is wrong in them.
 #include "DumpFile.h"
 
-#include <algorithm>
 #include <charconv>
 #include <system_error>
-#include <utility>
 
 #include "Values.h"
-#include "simulation/Error.h"
 #include "simulation/Shown.h"
 
 namespace morvik::comparison {
-
-DumpFile::DumpFile(std::istream& input, std::string name) : itsInput(input), itsName(std::move(name)) {}
-
-bool DumpFile::next()
-{
-    if (!std::getline(itsInput, itsLine)) {
-        itsLine.clear();
-        if (itsInput.bad()) {
-            throw simulation::fileError(itsName, "read");
-        }
-        return false;
-    }
-    ++itsNumber;
-    if (!itsLine.empty() && itsLine.back() == '\r') {
-        itsLine.pop_back();
-    }
-    return true;
-}
-
-std::string_view DumpFile::line() const
-{
-    return itsLine;
-}
-
-std::uint32_t DumpFile::number() const
-{
-    return itsNumber;
-}
-
-void DumpFile::fail(const std::string& what) const
-{
-    throw simulation::Error(itsName + ':' + std::to_string(std::max(itsNumber, 1U)) + ": " + what);
-}
 
 unsigned DumpFile::count(const std::string& what, std::string_view text, unsigned first, unsigned count) const
 {

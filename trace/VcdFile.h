@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-#include "vectors/TextFiles.h"
+#include "vectors/FileWriter.h"
 
 namespace morvik::trace {
 

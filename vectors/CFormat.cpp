@@ -5,8 +5,8 @@
 
 #include "Formats.h"
 #include "Numbers.h"
-#include "TextFiles.h"
 #include "simulation/Shown.h"
+#include "testbench/LineFile.h"
 
 namespace morvik::vectors {
 

@@ -2,8 +2,8 @@
 #ifndef MORVIK_VECTORS_FORMATS_H
 #define MORVIK_VECTORS_FORMATS_H
 
+#include "FileWriter.h"
 #include "Table.h"
-#include "TextFiles.h"
 
 namespace morvik::vectors {
 

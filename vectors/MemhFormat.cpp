@@ -4,8 +4,8 @@
 #include <utility>
 
 #include "Formats.h"
-#include "TextFiles.h"
 #include "simulation/Shown.h"
+#include "testbench/LineFile.h"
 
 namespace morvik::vectors {
 

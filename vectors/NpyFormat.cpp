@@ -5,7 +5,6 @@
 
 #include "Formats.h"
 #include "Numbers.h"
-#include "TextFiles.h"
 #include "simulation/Error.h"
 
 namespace morvik::vectors {

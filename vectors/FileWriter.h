@@ -1,10 +1,7 @@
-// TextFiles: files that are written and read in pieces, with their places in messages.
-#ifndef MORVIK_VECTORS_TEXTFILES_H
-#define MORVIK_VECTORS_TEXTFILES_H
+// FileWriter: a file that is written in pieces.
+#ifndef MORVIK_VECTORS_FILEWRITER_H
+#define MORVIK_VECTORS_FILEWRITER_H
 
-#include <cstddef>
-#include <cstdint>
-#include <fstream>
 #include <memory>
 #include <ostream>
 #include <string>
@@ -34,31 +31,6 @@ private:
 
     std::string itsName;
     std::unique_ptr<std::ostream> itsStream;
-};
-
-/// Reads lines that end in \n or \r\n. What goes wrong is thrown as a simulation::Error that opens with the place.
-class LineFile {
-public:
-    explicit LineFile(const std::string& fileName);
-
-    /// Goes to the next line; false at the end.
-    bool next();
-
-    const std::string& line() const
-    {
-        return itsLine;
-    }
-
-    /// FILE:LINE
-    std::string place() const;
-
-    [[noreturn]] void fail(const std::string& what) const;
-
-private:
-    std::string itsName;
-    std::ifstream itsFile;
-    std::string itsLine;
-    std::size_t itsNumber = 0;
 };
 
 }  // namespace morvik::vectors

@@ -1,6 +1,7 @@
-// TextFiles: files that are written and read in pieces, with their places in messages.
-#include "TextFiles.h"
+// FileWriter: a file that is written in pieces.
+#include "FileWriter.h"
 
+#include <fstream>
 #include <iostream>
 #include <utility>
 
@@ -50,38 +51,6 @@ void FileWriter::close()
 void FileWriter::fail() const
 {
     throw simulation::fileError(itsName, "written");
-}
-
-LineFile::LineFile(const std::string& fileName) : itsName(fileName), itsFile(fileName, std::ios::binary)
-{
-    if (!itsFile) {
-        throw simulation::fileError(fileName, "opened");
-    }
-}
-
-bool LineFile::next()
-{
-    if (!std::getline(itsFile, itsLine)) {
-        if (itsFile.bad()) {
-            throw simulation::fileError(itsName, "read");
-        }
-        return false;
-    }
-    ++itsNumber;
-    if (!itsLine.empty() && itsLine.back() == '\r') {
-        itsLine.pop_back();
-    }
-    return true;
-}
-
-std::string LineFile::place() const
-{
-    return itsName + ':' + std::to_string(itsNumber);
-}
-
-void LineFile::fail(const std::string& what) const
-{
-    throw simulation::Error(place() + ": " + what);
 }
 
 }  // namespace morvik::vectors
