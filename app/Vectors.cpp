@@ -167,7 +167,7 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
         ->type_name("HOW")
         ->default_str("packed");
     command.add_flag("--soft", settings.ratios, "Expect log-likelihood ratios, too");
-    command.add_flag("--internal", settings.internal, "Expect all values that the model traces, too");
+    command.add_flag("--internal", settings.internal, "Expect every value of each pass, too");
 }
 
 constexpr char explanation[] = R"(

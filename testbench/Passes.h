@@ -20,6 +20,9 @@ constexpr std::array<const char*, 23> passSignals = {"intrinsic", "g0",     "g1"
                                                      "alpha7",    "beta0",  "beta1",  "beta2",  "beta3",    "beta4",
                                                      "beta5",     "beta6",  "beta7",  "llr",    "extrinsic"};
 
+/// Bits of each, in two's complement, in eighths: -2048 stands for -256, 2047 for 255.875.
+constexpr unsigned passBits = 12;
+
 /// A constituent code by the encoder that it is of: half-iteration 0 decodes the second, the interleaved one (rule 15).
 constexpr unsigned constituentCode(unsigned halfIteration)
 {

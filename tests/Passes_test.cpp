@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "support/Blocks.h"
-#include "testbench/TraceReader.h"
+#include "support/TraceReader.h"
 
 namespace {
 
@@ -62,14 +62,14 @@ void expectTraced(unsigned K, int numPu, int algorithm)
 
     std::ostringstream warnings;
     Passes passes(block, core(numPu, algorithm), warnings);
-    morvik::TraceReader reader(trace, "trace");
+    support::TraceReader reader(trace, "trace");
     unsigned rows = 0;
-    for (morvik::TraceStep step; reader.next(step); ++rows) {
+    for (support::TraceStep step; reader.next(step); ++rows) {
         if (step.step == 0) {
             passes.next();
         }
-        for (std::size_t i = 0; i < morvik::traceSignals.size(); ++i) {
-            const std::string name = morvik::traceSignals[i];
+        for (std::size_t i = 0; i < support::traceSignals.size(); ++i) {
+            const std::string name = support::traceSignals[i];
             if (name[0] != 'g') {
                 ASSERT_EQ(passes.value(signalOfTrace(name), step.step), step.values[i])
                     << "K " << K << ", half-iteration " << step.halfIteration << ", step " << step.step << ' ' << name;

@@ -1,5 +1,5 @@
 // TraceReader: tests on the model's own trace, and on texts that are none.
-#include "testbench/TraceReader.h"
+#include "support/TraceReader.h"
 
 #include <gtest/gtest.h>
 
@@ -13,8 +13,8 @@
 
 namespace {
 
-using morvik::TraceReader;
-using morvik::TraceStep;
+using support::TraceReader;
+using support::TraceStep;
 
 std::vector<TraceStep> stepsOf(const std::string& text)
 {
@@ -42,7 +42,7 @@ void expectRefused(const std::string& text, const std::string& message)
 std::string row(const std::string& number, const std::string& value, const std::string& second = "")
 {
     std::string text = number;
-    for (std::size_t i = 0; i < morvik::traceSignals.size(); ++i) {
+    for (std::size_t i = 0; i < support::traceSignals.size(); ++i) {
         text += "    " + (i == 1 && !second.empty() ? second : value);
     }
     return text + '\n';

@@ -238,7 +238,8 @@ TEST_F(VectorSet, FindsAnotherInternalValue)
     const std::string found = difference();
     EXPECT_TRUE(std::regex_match(
         found,
-        std::regex(R"(csv, block 0 \(random, K = 40\): half-iteration 1, step 5, int is -?\d+, internal says 2000)")))
+        std::regex(
+            R"(csv, block 0 \(random, K = 40\): half-iteration 1, step 5, intrinsic is -?\d+, internal says 2000)")))
         << found;
 }
 

@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "support/CommandTest.h"
-#include "testbench/TraceReader.h"
+#include "support/TraceReader.h"
 #include "trace/TraceWriter.h"
 
 namespace {
@@ -136,9 +136,9 @@ TEST_F(CommandTrace, TableHasTheValuesOfTheText)
               "beta0,beta1,beta2,beta3,beta4,beta5,beta6,beta7,llr,extrinsic");
     ASSERT_EQ(lines.size(), 1 + 2 * 1027U);
     std::istringstream text(traced({vectors("k1024.csv"), "--half-iterations", "1:2"}));
-    morvik::TraceReader reader(text, "text");
+    support::TraceReader reader(text, "text");
     std::size_t line = 1;
-    for (morvik::TraceStep step; reader.next(step); ++line) {
+    for (support::TraceStep step; reader.next(step); ++line) {
         const std::vector<std::int64_t> numbers = numbersOf(lines[line]);
         ASSERT_EQ(numbers[0], step.halfIteration);
         ASSERT_EQ(numbers[1], step.halfIteration % 2 == 0 ? 2 : 1);

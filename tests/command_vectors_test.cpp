@@ -1,5 +1,7 @@
 // The command morvik vectors: its options, what it prints, and its exit status.
 #include <nlohmann/json.hpp>
+#include <sstream>
+#include <string>
 
 #include "support/CommandTest.h"
 
@@ -52,6 +54,36 @@ TEST_F(CommandVectors, WritesWhatDecodeReads)
         expected += rows[comma + 1];
     }
     EXPECT_EQ(decoded.out, expected + '\n');
+}
+
+/// The half-iteration, step and signals of a row of `morvik trace`, behind the number of the block.
+std::string withoutPlace(const std::string& row)
+{
+    std::istringstream fields(row);
+    std::string kept;
+    std::string field;
+    for (unsigned i = 0; std::getline(fields, field, ','); ++i) {
+        const bool isPlace = i == 2 || (i >= 4 && i < 8);  // code; segment, window, unit and thread
+        kept += isPlace ? "" : ',' + field;
+    }
+    return kept.substr(1);
+}
+
+TEST_F(CommandVectors, ExpectsInsideWhatTraceShows)
+{
+    vectors({"--out", "set", "--block-size", "512", "--blocks", "1", "--no-directed", "--format", "csv", "--internal"});
+    const CommandResult traced = morvik.run({"trace", "set/stimulus.csv", "--format", "csv"});
+    ASSERT_EQ(traced.status, 0) << traced.err;
+    std::istringstream internal(morvik.read("set/internal.csv"));
+    std::istringstream trace(traced.out);
+    unsigned rows = 0;
+    std::string step;
+    for (std::string row; std::getline(internal, row); ++rows) {
+        ASSERT_TRUE(std::getline(trace, step)) << rows;
+        ASSERT_EQ(row, withoutPlace(step));
+    }
+    EXPECT_EQ(rows, 1 + 16 * (512 + 3U));
+    EXPECT_FALSE(std::getline(trace, step)) << step;
 }
 
 TEST_F(CommandVectors, NamesTheCommandThatMakesTheSetAgain)

@@ -7,8 +7,6 @@ namespace morvik::trace {
 
 namespace {
 
-constexpr unsigned metricBits = 12;
-
 class TableTrace : public TraceWriter {
 public:
     TableTrace(std::unique_ptr<vectors::TableWriter> table, std::uint32_t block, Selection selection)
@@ -63,7 +61,7 @@ vectors::Table traceTable(const Selection& selection)
                              {"unit", 3, false},
                              {"thread", 2, false}}};
     for (const unsigned signal : selection.signals) {
-        table.columns.push_back({passSignals[signal], metricBits, true});
+        table.columns.push_back({passSignals[signal], passBits, true});
     }
     return table;
 }

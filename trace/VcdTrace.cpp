@@ -11,8 +11,6 @@ namespace morvik::trace {
 
 namespace {
 
-constexpr unsigned metricBits = 12;
-
 /// All segments go through their steps at the same time, as the hardware's threads do. A pass takes the steps of a
 /// segment, and those of the tail.
 class VcdTrace : public TraceWriter {
@@ -87,7 +85,7 @@ private:
         Thread thread = {place.segment, itsFile.addWire("step", 13), itsFile.addWire("window", 4), {}};
         for (const unsigned signal : itsSelection.signals) {
             const std::string name = passSignals[signal];
-            thread.signals.push_back({itsFile.addWire(name, metricBits), itsFile.addReal(name + "_real")});
+            thread.signals.push_back({itsFile.addWire(name, passBits), itsFile.addReal(name + "_real")});
         }
         itsThreads.push_back(thread);
         itsFile.endScope();

@@ -13,8 +13,6 @@ namespace morvik::vectors {
 
 namespace {
 
-constexpr unsigned metricBits = 12;
-
 /// The streams as `morvik decode` names them.
 constexpr std::array<const char*, 3> streamNames = {"rsc1_sys", "rsc1_par", "rsc2_par"};
 
@@ -32,8 +30,8 @@ Table blocksTable()
 Table internalTable()
 {
     Table table = {"internal", {{"half_iteration", 5, false}, {"step", 13, false}}};
-    for (const char* const signal : traceSignals) {
-        table.columns.push_back({signal, metricBits, true});
+    for (const char* const signal : passSignals) {
+        table.columns.push_back({signal, passBits, true});
     }
     return table;
 }
@@ -71,7 +69,7 @@ Layout::Layout(const Format& format, const Settings& settings)
         return tables.size() - 1;
     };
     expected = add({"expected", {{"bit", 1, false}}});
-    ratios = settings.ratios ? add({"ratios", {{"ratio", metricBits, true}}}) : 0;
+    ratios = settings.ratios ? add({"ratios", {{"ratio", passBits, true}}}) : 0;
     internal = settings.internal ? add(internalTable()) : 0;
 }
 
@@ -102,7 +100,7 @@ void BlockWriter::add(const Stimulus& stimulus, const Expected& expected)
     for (const std::int16_t ratio : expected.ratios) {
         addRow(itsLayout.ratios, {ratio});
     }
-    for (const TraceStep& step : expected.internal) {
+    for (const InternalStep& step : expected.internal) {
         Row row = {step.halfIteration, step.step};
         row.insert(row.end(), step.values.begin(), step.values.end());
         addRow(itsLayout.internal, row);
@@ -215,7 +213,7 @@ void BlockReader::readInternal(Expected& expected, std::uint32_t K)
 {
     for (std::uint32_t i = 0; i < 2 * itsIterations * (K + tailSteps); ++i) {
         readRow(itsLayout.internal);
-        TraceStep step;
+        InternalStep step;
         step.halfIteration = static_cast<std::uint32_t>(itsRow[0]);
         step.step = static_cast<std::uint32_t>(itsRow[1]);
         std::transform(itsRow.begin() + 2, itsRow.end(), step.values.begin(), [](std::int64_t value) {

@@ -4,7 +4,7 @@
 //   stimulus    K + 4 rows for each block: the three soft values of a position
 //   expected    K rows for each block: the decisions
 //   ratios      K rows for each block: log-likelihood ratios in eighths
-//   internal    K + 3 rows for each half-iteration of each block: traced values in eighths
+//   internal    K + 3 rows for each half-iteration of each block: values of the pass in eighths
 #ifndef MORVIK_VECTORS_BLOCKFILES_H
 #define MORVIK_VECTORS_BLOCKFILES_H
 

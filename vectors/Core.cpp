@@ -1,8 +1,6 @@
 // Core: the model as the source of what is expected.
 #include "Core.h"
 
-#include <algorithm>
-
 namespace morvik::vectors {
 
 namespace {
@@ -15,22 +13,33 @@ SoftBlock softBlock(const Stimulus& stimulus)
     return {widened(stimulus.streams[0]), widened(stimulus.streams[1]), widened(stimulus.streams[2])};
 }
 
+std::vector<InternalStep> internalSteps(Passes passes, std::uint32_t iterations)
+{
+    std::vector<InternalStep> steps;
+    const std::uint32_t count = passes.division().K() + tailSteps;
+    for (std::uint32_t halfIteration = 0; halfIteration < 2 * iterations; ++halfIteration) {
+        passes.next();
+        for (std::uint32_t step = 0; step < count; ++step) {
+            steps.push_back({halfIteration, step, {}});
+            for (unsigned signal = 0; signal < passSignals.size(); ++signal) {
+                if (passes.isComputed(signal, step)) {
+                    steps.back().values[signal] = passes.value(signal, step);
+                }
+            }
+        }
+    }
+    return steps;
+}
+
 }  // namespace
 
 Core::Core(const Settings& settings) : itsSettings(settings), itsDecoder(settings.generics, itsMessages) {}
 
 Expected Core::expect(const Stimulus& stimulus)
 {
-    // A trace shows metric columns that earlier blocks left: each traced block gets a decoder of its own.
-    std::ostringstream trace;
-    std::unique_ptr<Decoder> tracing;
-    if (itsSettings.internal) {
-        tracing = std::make_unique<Decoder>(itsSettings.generics, trace);
-        tracing->armTrace(2 * itsSettings.iterations);
-    }
+    const SoftBlock block = softBlock(stimulus);
     itsMessages.str({});
-    Decoder& decoder = tracing ? *tracing : itsDecoder;
-    Decoded decoded = decoder.decodeWithRatios(softBlock(stimulus), itsSettings.iterations, stimulus.tag);
+    Decoded decoded = itsDecoder.decodeWithRatios(block, itsSettings.iterations, stimulus.tag);
 
     Expected expected;
     expected.tag = decoded.tag;
@@ -42,12 +51,8 @@ Expected Core::expect(const Stimulus& stimulus)
             ratio = static_cast<std::int16_t>(ratio / unitsOfEighth);
         }
     }
-    if (tracing) {
-        std::istringstream text(trace.str());
-        TraceReader reader(text, "the trace of the model");
-        for (TraceStep step; reader.next(step);) {
-            expected.internal.push_back(step);
-        }
+    if (itsSettings.internal) {
+        expected.internal = internalSteps(Passes(block, itsSettings.generics, itsMessages), itsSettings.iterations);
     }
     return expected;
 }

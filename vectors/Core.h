@@ -2,7 +2,6 @@
 #ifndef MORVIK_VECTORS_CORE_H
 #define MORVIK_VECTORS_CORE_H
 
-#include <memory>
 #include <sstream>
 
 #include "Block.h"

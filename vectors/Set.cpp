@@ -71,7 +71,7 @@ std::optional<std::string> differenceOf(const std::string& what,
     return wrong(what + ' ' + std::to_string(one - got.begin()), *one, *other, table);
 }
 
-std::optional<std::string> differenceOf(const std::vector<TraceStep>& got, const std::vector<TraceStep>& wanted)
+std::optional<std::string> differenceOf(const std::vector<InternalStep>& got, const std::vector<InternalStep>& wanted)
 {
     for (std::size_t i = 0; i < std::min(got.size(), wanted.size()); ++i) {
         const std::string place =
@@ -80,10 +80,10 @@ std::optional<std::string> differenceOf(const std::vector<TraceStep>& got, const
             return place + " stands where internal has half-iteration " + std::to_string(wanted[i].halfIteration) +
                    ", step " + std::to_string(wanted[i].step);
         }
-        for (std::size_t signal = 0; signal < traceSignals.size(); ++signal) {
+        for (std::size_t signal = 0; signal < passSignals.size(); ++signal) {
             if (got[i].values[signal] != wanted[i].values[signal]) {
                 return wrong(
-                    place + ", " + traceSignals[signal], got[i].values[signal], wanted[i].values[signal], "internal");
+                    place + ", " + passSignals[signal], got[i].values[signal], wanted[i].values[signal], "internal");
             }
         }
     }

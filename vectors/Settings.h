@@ -24,7 +24,7 @@ struct Settings {
     unsigned width = 8;            ///< bits of a soft value in the files: 8 or 16
     bool separateStreams = false;  ///< whether memh has a file for each stream
     bool ratios = false;
-    bool internal = false;  ///< all values that the model traces
+    bool internal = false;  ///< every value of each pass
 };
 
 }  // namespace morvik::vectors
