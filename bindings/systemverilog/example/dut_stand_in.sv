@@ -1,9 +1,9 @@
 // dut_stand_in: takes the place of the turbo decoder core in the example. It accepts the K + 4 positions of a block, one
-// with each clock, and then plays recorded decisions, one bit with each clock. +break_block=B +break_bit=I turns bit I
-// of block B over, as a bug would.
+// with each clock, and then plays the decisions that a set of vectors expects, one bit with each clock. +break_block=B
+// +break_bit=I turns bit I of block B over, as a bug would.
 module dut_stand_in (
     input logic clk,
-    input logic [31:0] K,  // stable from the first clock on
+    input logic [31:0] K,  // stable from the first position of a block to its last decision
     input logic din_valid,
     input logic signed [7:0] sys,
     input logic signed [7:0] par1,
@@ -11,39 +11,29 @@ module dut_stand_in (
     output logic dout_valid,
     output logic dout
 );
-    string name;
-    int file, break_block, break_bit;
-    int block = 0, position = 0, playing = -1;
+    string set;
+    bit expected[int];  // the bits of all blocks, one after the other
+    int break_block, break_bit;
+    int block = 0, position = 0, playing = -1, played = 0;
 
     initial begin
         dout_valid = 0;
-        if (!$value$plusargs("decisions=%s", name))
-            $fatal(1, "+decisions=FILE is missing");
-        file = $fopen(name, "r");
-        if (file == 0)
-            $fatal(1, "%s cannot be read", name);
+        if (!$value$plusargs("set=%s", set))
+            $fatal(1, "+set=DIR is missing");
+        $readmemh({set, "/expected.memh"}, expected);
         if (!$value$plusargs("break_block=%d", break_block))
             break_block = -1;
         if (!$value$plusargs("break_bit=%d", break_bit))
             break_bit = 0;
     end
 
-    // The next character of the file that is a bit.
-    function automatic logic recorded();
-        int code;
-        code = $fgetc(file);
-        while (code != "0" && code != "1") begin
-            if (code < 0)
-                $fatal(1, "%s has no decisions left", name);
-            code = $fgetc(file);
-        end
-        return code == "1";
-    endfunction
-
     always @(posedge clk) begin
         dout_valid <= playing >= 0;
         if (playing >= 0) begin
-            dout <= recorded() ^ (block == break_block && playing == break_bit);
+            if (expected.exists(played) == 0)
+                $fatal(1, "%s/expected.memh ends at bit %0d", set, played);
+            dout <= expected[played] ^ (block == break_block && playing == break_bit);
+            played <= played + 1;
             playing <= playing + 1 < K ? playing + 1 : -1;
             if (playing + 1 == K)
                 block <= block + 1;
