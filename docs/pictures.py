@@ -309,5 +309,6 @@ def borders():
     return svg(int(right + 250), key + 124, elements)
 
 
-for picture in (trellis, windows, turbo, interleaver, borders):
-    (FOLDER / f"{picture.__name__}.svg").write_text(picture())
+if __name__ == "__main__":
+    for picture in (trellis, windows, turbo, interleaver, borders):
+        (FOLDER / f"{picture.__name__}.svg").write_text(picture())
