@@ -3,11 +3,13 @@
 
 #include <iostream>
 #include <memory>
+#include <optional>
 #include <string>
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
 #include "Files.h"
+#include "OtherRuns.h"
 #include "SoftValueReader.h"
 #include "comparison/Comparison.h"
 #include "comparison/Dump.h"
@@ -71,10 +73,11 @@ bool isVcd(const Options& options)
 
 int compare(const Options& options)
 {
-    const SoftBlock block = readBlock(options.block, options.number);
+    const ComparedRun run = {
+        options.block, options.number, readBlock(options.block, options.number), options.decoder.generics};
     const comparison::NameMap map = readMap(options.map);
     const comparison::Model model =
-        comparison::computeModel(block, options.decoder.generics, options.decoder.iterations, std::cerr);
+        comparison::computeModel(run.block, run.generics, options.decoder.iterations, std::cerr);
     comparison::Dump dump(model.values.passes(), model.values.steps());
     InputFile input(options.dump);
     (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);
@@ -82,7 +85,11 @@ int compare(const Options& options)
     if (found.compared() == 0) {
         throw FileError(input.name(), "holds no value that the core computes");
     }
-    std::cout << comparison::textOf(found, model, dump, input.name()) << std::flush;
+    // Few values may agree with another run by chance.
+    constexpr std::uint64_t telling = 64;
+    const auto otherRun =
+        found.first && found.compared() >= telling ? findOtherRun(run, dump.values) : std::optional<std::string>();
+    std::cout << comparison::textOf(found, model, dump, input.name(), otherRun) << std::flush;
     if (!std::cout) {
         throw FileError("<stdout>", cannotBe("written"));
     }

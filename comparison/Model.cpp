@@ -2,6 +2,7 @@
 #include "Model.h"
 
 #include <cstddef>
+#include <sstream>
 #include <utility>
 
 #include "src/TDecoder3GPU.h"
@@ -58,6 +59,25 @@ Model computeModel(const SoftBlock& block,
             windowsOf(passes.division()),
             {{{core.itsSys[0], core.itsPar0[0], core.itsInterleaver->itsPiInv},
               {core.itsSys[1], core.itsPar0[1], core.itsInterleaver->itsPi}}}};
+}
+
+bool computesAll(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, const Values& dump)
+{
+    std::ostringstream warnings;
+    Passes passes(block, generics, warnings);
+    for (unsigned pass = 0; pass < dump.passes(); ++pass) {
+        passes.next();
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            for (unsigned step = 0; step < dump.steps(); ++step) {
+                const Place place = {pass, signal, step};
+                if (dump.has(place) && passes.isComputed(signal, step) &&
+                    dump.at(place) != passes.value(signal, step)) {
+                    return false;
+                }
+            }
+        }
+    }
+    return true;
 }
 
 std::vector<unsigned> stepsInOrder(const Windows& windows, Stage stage)

@@ -63,6 +63,10 @@ Model computeModel(const SoftBlock& block,
                    unsigned iterations,
                    std::ostream& warnings);
 
+/// Whether all values of the dump are those that the core computes on the block. Values where it computes none do not
+/// count.
+bool computesAll(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, const Values& dump);
+
 /// The steps of a stage in the order in which the core computes them: the segments at the same time, the backward
 /// recursion window by window from its end.
 std::vector<unsigned> stepsInOrder(const Windows& windows, Stage stage);

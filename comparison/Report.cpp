@@ -68,8 +68,12 @@ std::string shortName(Stage stage)
 
 class Reporter {
 public:
-    Reporter(const Comparison& comparison, const Model& model, const Dump& dump, const std::string& name)
-        : itsComparison(comparison), itsModel(model), itsDump(dump), itsName(name)
+    Reporter(const Comparison& comparison,
+             const Model& model,
+             const Dump& dump,
+             const std::string& name,
+             const std::optional<std::string>& otherRun)
+        : itsComparison(comparison), itsModel(model), itsDump(dump), itsName(name), itsOtherRun(otherRun)
     {
     }
 
@@ -237,11 +241,16 @@ private:
 
     void addFindings()
     {
-        if (const auto shift = findShift(itsModel, itsDump.values)) {
+        if (itsOtherRun) {
+            itsText += "Found: the dump is what the model computes " + *itsOtherRun + ".\n";
+        } else if (const auto shift = findShift(itsModel, itsDump.values)) {
             itsText += "Found: " + *shift + ".\n";
             return;
         }
         for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison)) {
+            if (itsOtherRun && finding.how.empty()) {
+                continue;  // it is explained
+            }
             const std::string values = wordsOf(finding.stage).values;
             itsText += "Found in " + values + ", " +
                        counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
@@ -263,14 +272,19 @@ private:
     const Model& itsModel;
     const Dump& itsDump;
     const std::string& itsName;
+    const std::optional<std::string>& itsOtherRun;
     std::string itsText;
 };
 
 }  // namespace
 
-std::string textOf(const Comparison& comparison, const Model& model, const Dump& dump, const std::string& name)
+std::string textOf(const Comparison& comparison,
+                   const Model& model,
+                   const Dump& dump,
+                   const std::string& name,
+                   const std::optional<std::string>& otherRun)
 {
-    return Reporter(comparison, model, dump, name).text();
+    return Reporter(comparison, model, dump, name, otherRun).text();
 }
 
 }  // namespace morvik::comparison

@@ -1,4 +1,5 @@
 // The command morvik compare: dumps of cores with a fault, and of the core itself.
+#include <algorithm>
 #include <cstdlib>
 #include <ostream>
 #include <sstream>
@@ -37,14 +38,19 @@ std::string softText(const blocks::Block& block)
     return text;
 }
 
+blocks::Block noisyBlock(unsigned K, int amplitude = 16)
+{
+    blocks::Random random(1);
+    blocks::Block block = blocks::encode(blocks::randomBits(random, K), amplitude);
+    blocks::addNoise(random, 14, block);
+    return block;
+}
+
 class Compare : public CommandTest {
 protected:
     void writeBlock(unsigned K, int amplitude = 16) const
     {
-        blocks::Random random(1);
-        blocks::Block block = blocks::encode(blocks::randomBits(random, K), amplitude);
-        blocks::addNoise(random, 14, block);
-        morvik.write("block.csv", softText(block));
+        morvik.write("block.csv", softText(noisyBlock(K, amplitude)));
     }
 
     /// Has a core with the fault write rtl.csv.
@@ -247,6 +253,74 @@ TEST_F(Compare, PassesOnTheWarningsOfTheModel)
     const CommandResult result = compare();
     EXPECT_EQ(result.status, 0) << result.out;
     EXPECT_TRUE(has(result.err, "WARNING:")) << result.err;
+}
+
+TEST_F(Compare, TellsWhichCoreADumpIsOf)
+{
+    writeBlock(512);
+    writeDump("none", 2, 2);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "\nFound: the dump is what the model computes with --algorithm table.\n"))
+        << result.out;
+    EXPECT_EQ(compare({"--algorithm", "table"}).status, 0);
+    writeBlock(1088);
+    writeDump("none", 8, 0);
+    EXPECT_TRUE(has(compare().out, "computes with --algorithm max-log and --num-pu 4 or 8.\n"));
+}
+
+TEST_F(Compare, TellsWhichBlockADumpIsOf)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    const std::string rows = morvik.read("block.csv").substr(header.size() + 1);
+    morvik.write("block.csv", header + '\n' + zeroRows("7", 52) + zeroRows("8", 44) + rows);
+    EXPECT_TRUE(has(compare({"--block-number", "1"}).out, "model computes of block 2 of block.csv.\n"));
+    morvik.write("block.csv", header + '\n' + zeroRows("7", 44) + "none of the blocks\n" + rows);
+    EXPECT_EQ(compare().status, 1);
+}
+
+TEST_F(Compare, TellsAMistakeInTheBlock)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    const auto expectFound = [&](const blocks::Block& block, const std::string& what) {
+        morvik.write("block.csv", softText(block));
+        const std::string found = compare().out;
+        EXPECT_TRUE(has(found, "\nFound: the dump is what the model computes if, in the block, " + what + ".\n"))
+            << found;
+    };
+    blocks::Block block = noisyBlock(40);
+    std::swap(block.par1, block.par2);
+    expectFound(block, "rsc1_par and rsc2_par are swapped");
+    block = noisyBlock(40);
+    for (auto& value : block.par1) {
+        value = -value;
+    }
+    expectFound(block, "the sign of rsc1_par is flipped");
+    block = noisyBlock(40);
+    for (auto* const stream : {&block.sys, &block.par1, &block.par2}) {
+        std::swap_ranges(stream->end() - 4, stream->end() - 2, stream->end() - 2);
+    }
+    expectFound(block, "the tail has the second encoder's values first");
+    block = noisyBlock(40);
+    for (auto* const stream : {&block.sys, &block.par1, &block.par2}) {
+        std::reverse(stream->begin(), stream->end());
+    }
+    expectFound(block, "the rows are in reversed order, tail first");
+}
+
+TEST_F(Compare, TakesFewValuesForNoOtherRun)
+{
+    writeBlock(40);
+    writeDump("none", 2, 2);
+    const std::string all = morvik.read("rtl.csv");
+    std::size_t end = 0;
+    for (int line = 0; line < 50; ++line) {
+        end = all.find('\n', end) + 1;
+    }
+    morvik.write("rtl.csv", all.substr(0, end));
+    EXPECT_FALSE(has(compare().out, "the dump is what the model computes"));
 }
 
 TEST_F(Compare, NamesBadFiles)

@@ -1,0 +1,120 @@
+// OtherRuns: what the model would have to be given, so that it computes a dump that is not the one of its options.
+#include "OtherRuns.h"
+
+#include <filesystem>
+#include <system_error>
+#include <vector>
+
+#include "Files.h"
+#include "Mistakes.h"
+#include "SoftValueReader.h"
+#include "comparison/Model.h"
+#include "simulation/Point.h"
+
+namespace morvik {
+
+namespace {
+
+/// "--num-pu 4 or 8", the units with which a core computes the dump; an empty text when those of `run` do; nothing when
+/// none do.
+std::optional<std::string> unitsThatFit(ComparedRun run, const comparison::Values& dump)
+{
+    std::string units;
+    const std::int32_t own = run.generics.C_NUM_PU;
+    for (const std::int32_t each : {2, 4, 8}) {
+        run.generics.C_NUM_PU = each;
+        if (comparison::computesAll(run.block, run.generics, dump)) {
+            if (each == own) {
+                return "";
+            }
+            units += (units.empty() ? "--num-pu " : " or ") + std::to_string(each);
+        }
+    }
+    return units.empty() ? std::nullopt : std::optional(units);
+}
+
+std::optional<std::string> findCore(const ComparedRun& run, const comparison::Values& dump)
+{
+    for (const std::int32_t algorithm : {0, 1, 2}) {
+        ComparedRun other = run;
+        other.generics.C_ALGORITHM_TYPE = algorithm;
+        const auto units = unitsThatFit(other, dump);
+        if (units && algorithm == run.generics.C_ALGORITHM_TYPE) {
+            return "with " + *units;
+        }
+        if (units) {
+            return "with --algorithm " + simulation::algorithmName(static_cast<unsigned>(algorithm)) +
+                   (units->empty() ? "" : " and " + *units);
+        }
+    }
+    return std::nullopt;
+}
+
+std::optional<std::string> findBlock(const ComparedRun& run, const comparison::Values& dump)
+try {
+    std::error_code ignored;
+    if (!std::filesystem::is_regular_file(run.file, ignored)) {
+        return std::nullopt;  // it can be read but once
+    }
+    InputFile input(run.file);
+    SoftValueReader reader(input.stream(), input.name());
+    SoftBlock block;
+    for (std::uint32_t number = 0; reader.next(block); ++number) {
+        if (number != run.number && block.size() == run.block.size() &&
+            comparison::computesAll(block, run.generics, dump)) {
+            return "of block " + std::to_string(number) + " of " + run.file;
+        }
+    }
+    return std::nullopt;
+} catch (const FileError&) {
+    return std::nullopt;  // what follows the block in the file need not be blocks
+}
+
+/// One mistake at a time, of those that leave a block of this size.
+std::vector<doctor::Mistakes> allMistakes()
+{
+    std::vector<doctor::Mistakes> all;
+    const auto add = [&all](auto member, auto value) {
+        all.emplace_back();
+        all.back().*member = value;
+    };
+    for (unsigned columns = 1; columns < 8; ++columns) {
+        add(&doctor::Mistakes::flipped, columns);
+    }
+    for (std::size_t i = 1; i < doctor::columnContents.size(); ++i) {
+        add(&doctor::Mistakes::columns, i);
+    }
+    for (std::size_t i = 1; i < doctor::tailContents.size(); ++i) {
+        add(&doctor::Mistakes::tail, i);
+    }
+    for (const int doublings : {-3, -2, -1, 1, 2, 3}) {
+        add(&doctor::Mistakes::doublings, doublings);
+    }
+    add(&doctor::Mistakes::order, doctor::Order::rowsReversed);
+    add(&doctor::Mistakes::order, doctor::Order::dataReversed);
+    return all;
+}
+
+std::optional<std::string> findMistake(const ComparedRun& run, const comparison::Values& dump)
+{
+    for (const doctor::Mistakes& mistakes : allMistakes()) {
+        if (comparison::computesAll(doctor::undone({run.block, {}}, mistakes).received, run.generics, dump)) {
+            return "if, in the block, " + doctor::explain(mistakes).front().what;
+        }
+    }
+    return std::nullopt;
+}
+
+}  // namespace
+
+std::optional<std::string> findOtherRun(const ComparedRun& run, const comparison::Values& dump)
+{
+    for (const auto find : {findCore, findBlock, findMistake}) {
+        if (auto found = find(run, dump)) {
+            return found;
+        }
+    }
+    return std::nullopt;
+}
+
+}  // namespace morvik
