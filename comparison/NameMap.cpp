@@ -263,7 +263,8 @@ std::string NameMap::expectedNumber(unsigned signal) const
     case NumberForm::integer:
         return "an integer from -2048 to 2047";
     default:
-        return "an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to 255.875";
+        return "an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to 255.875; a map tells "
+               "other forms";
     }
 }
 

@@ -102,6 +102,10 @@ private:
             faults,
             finding,
             [](const Fault& fault) { return fault.got == (fault.wanted < 0 ? Values::largest : Values::smallest); });
+        consider("values are whole numbers where eighths are expected: \"numbers\": \"real\" in a map may be missing",
+                 faults,
+                 finding,
+                 [](const Fault& fault) { return fault.got == fault.wanted / 8 || fault.got == fault.wanted >> 3; });
         consider("zeros", faults, finding, [](const Fault& fault) { return fault.got == 0; });
         consider("values of the step before", faults, finding, [this](const Fault& fault) {
             return isOfOtherStep(fault, -1);

@@ -123,7 +123,7 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
 {
     const std::string numbers =
         " is not allowed, expected an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to "
-        "255.875";
+        "255.875; a map tells other forms";
     expectRefused(readCsv, "", "dump:1: no header, expected the columns half_iteration, step, signal, value");
     expectRefused(readCsv, "a,b\n", R"(dump:1: no column "half_iteration" in the header "a,b")");
     expectRefused(readCsv, header + "0,0,llr\n", "dump:2: 3 fields, expected the 4 of the header");

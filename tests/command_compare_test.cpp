@@ -228,6 +228,26 @@ TEST_F(Compare, TellsWhatADumpOfRatiosAloneTells)
     EXPECT_TRUE(has(result.out, "the sign is flipped")) << result.out;
 }
 
+TEST_F(Compare, TellsThatRealNumbersLackTheirPoints)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    std::string ratios = "half_iteration,step,signal,value\n";
+    std::istringstream all(morvik.read("rtl.csv"));
+    for (std::string line; std::getline(all, line);) {
+        if (has(line, ",llr,")) {
+            const std::size_t value = line.rfind(',') + 1;
+            std::ostringstream real;
+            real << std::stoi(line.substr(value)) / 8.0;  // 9, not 9.0
+            ratios += line.substr(0, value) + real.str() + '\n';
+        }
+    }
+    morvik.write("rtl.csv", ratios);
+    EXPECT_TRUE(has(compare().out, "values are whole numbers where eighths are expected: \"numbers\": \"real\""));
+    morvik.write("map.json", R"({"numbers": "real"})");
+    EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
+}
+
 TEST_F(Compare, TellsThatADumpCountsInAnotherWay)
 {
     writeBlock(512);
@@ -334,7 +354,7 @@ TEST_F(Compare, NamesBadFiles)
     morvik.write("rtl.csv", withLine(good, 9, "0,0,alpha3,2048"));
     expectRefused(compare(),
                   "rtl.csv:9: alpha3 \"2048\" is not allowed, expected an integer from -2048 to 2047, or a multiple of "
-                  "1/8 with a point from -256.0 to 255.875");
+                  "1/8 with a point from -256.0 to 255.875; a map tells other forms");
     morvik.write("rtl.csv", "half_iteration,step,signal,value\n");
     expectRefused(compare(), "rtl.csv: holds no value that the core computes");
     morvik.write("block.csv", header + '\n' + zeroRows("0", 45));
