@@ -33,7 +33,7 @@ struct NamedMistake {
     const char* text;
 };
 
-constexpr std::array<NamedMistake, 15> namedMistakes = {{
+constexpr std::array<NamedMistake, 18> namedMistakes = {{
     {Mistake::borderBitsKept, "the seven low bits of border metrics are not cleared (rule 11)"},
     {Mistake::borderOfOtherPass,
      "border metrics are those of the other pass: this one's for the last one's, or the reverse (rule 20)"},
@@ -41,6 +41,9 @@ constexpr std::array<NamedMistake, 15> namedMistakes = {{
     {Mistake::aprioriMissing, "the extrinsic values of the pass before do not arrive (rule 13)"},
     {Mistake::aprioriOfPassBefore, "a pass late: extrinsic values are those of the pass before the last (rule 13)"},
     {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
+    {Mistake::aprioriInverse, "extrinsic values are taken by the inverse of the permutation (rule 15)"},
+    {Mistake::aprioriBefore, "extrinsic values are taken by the interleaver's address for the step before (rule 15)"},
+    {Mistake::aprioriBehind, "extrinsic values are taken by the interleaver's address for the step behind (rule 15)"},
     {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
     {Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"},
     {Mistake::parityNegated, "the sign of the parity is flipped (rule 5)"},

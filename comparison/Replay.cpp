@@ -140,6 +140,24 @@ Aligned Replay::inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& c
     return words;
 }
 
+unsigned Replay::aprioriStep(unsigned code, unsigned trellisStep, Mistake mistake) const
+{
+    const unsigned K = itsModel.windows.K;
+    const auto& order = itsModel.codes[code].order;
+    switch (mistake) {
+    case Mistake::aprioriUnpermuted:
+        return trellisStep;
+    case Mistake::aprioriInverse:
+        return itsModel.codes[1 - code].order[trellisStep];
+    case Mistake::aprioriBefore:
+        return order[(trellisStep + K - 1) % K];
+    case Mistake::aprioriBehind:
+        return order[(trellisStep + 1) % K];
+    default:
+        return order[trellisStep];
+    }
+}
+
 int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const
 {
     const unsigned d = codeOf(pass);
@@ -148,7 +166,7 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
     int apriori = 0;
     const unsigned back = mistake == Mistake::aprioriOfPassBefore ? 2 : 1;
     if (!isTail && pass >= back && mistake != Mistake::aprioriMissing) {
-        const unsigned from = mistake == Mistake::aprioriUnpermuted ? trellisStep : code.order[trellisStep];
+        const unsigned from = aprioriStep(d, trellisStep, mistake);
         apriori = input({pass - back, signalsOf(Stage::extrinsic).first, from}, complete);
     }
     const bool unpermuted = mistake == Mistake::systematicUnpermuted && !isTail;

@@ -14,9 +14,12 @@ namespace morvik::comparison {
 /// A mistake in an operation, by which it gives other values than the core's.
 enum class Mistake : std::uint8_t {
     none,
-    aprioriMissing,        ///< intrinsic values from the systematic ones alone
-    aprioriOfPassBefore,   ///< extrinsic values of the pass before the last one
-    aprioriUnpermuted,     ///< extrinsic values in the order of the other code
+    aprioriMissing,       ///< intrinsic values from the systematic ones alone
+    aprioriOfPassBefore,  ///< extrinsic values of the pass before the last one
+    aprioriUnpermuted,    ///< extrinsic values in the order of the other code
+    aprioriInverse,       ///< by the permutation that leads to the other code
+    aprioriBefore,        ///< by the interleaver's address for the step before
+    aprioriBehind,
     systematicUnpermuted,  ///< systematic values in the natural order, on the interleaved code
     parityOfOtherCode,
     parityNegated,
@@ -55,6 +58,8 @@ private:
     template <class Aligned>
     Aligned inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& complete) const;
 
+    /// The step of the pass before whose extrinsic value a step takes.
+    unsigned aprioriStep(unsigned code, unsigned trellisStep, Mistake mistake) const;
     int twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const;
     int twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const;
     bool givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const;

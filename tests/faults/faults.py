@@ -41,6 +41,10 @@ FAULTS = {
         ("j < K ? itsExtrinsic[from[j]] : 0", "j < K && h >= 1 ? held[h - 1][from[j]] : 0")]),
     "apriori_missing": (DECODER, DECODER, [("j < K ? itsExtrinsic[from[j]] : 0", "from[j % K] > K ? 1 : 0")]),
     "apriori_unpermuted": (DECODER, DECODER, [("j < K ? itsExtrinsic[from[j]]", "j < K && from[j] < K ? itsExtrinsic[j]")]),
+    "apriori_inverse": (DECODER, DECODER, [
+        ("const std::vector<unsigned>& from = permutation(d);",
+         "const std::vector<unsigned>& from = preparePermutation(1 - d, K) ? permutation(1 - d) : permutation(d);")]),
+    "apriori_behind": (DECODER, DECODER, [("itsExtrinsic[from[j]]", "itsExtrinsic[from[(j + 1) % K]]")]),
     "systematic_unpermuted": (DECODER, DECODER, [("itsSys[0][itsInterleaver->itsPi[i]]", "itsSys[0][i]")]),
     "branch_unclipped": (ENGINE, ENGINE, [("wrap16(arithmetic::clip(sums[i], lo, hi))",
                                            "wrap16(lo < hi ? sums[i] : 0)")]),
