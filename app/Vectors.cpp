@@ -73,7 +73,8 @@ std::string blocksAndFormats(const vectors::Manifest& manifest)
     const auto name = [](const vectors::ManifestFormat& format) {
         return format.name;
     };
-    return std::to_string(manifest.blocks.size()) + " blocks in " + listed(manifest.formats, name);
+    const std::size_t count = manifest.blocks.size();
+    return std::to_string(count) + (count == 1 ? " block in " : " blocks in ") + listed(manifest.formats, name);
 }
 
 int make(const Options& options)

@@ -105,7 +105,9 @@ TEST_F(CommandVectors, NamesTheCommandThatMakesTheSetAgain)
 
 TEST_F(CommandVectors, TellsADifference)
 {
-    vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed", "--format", "csv", "--soft"});
+    const CommandResult made =
+        vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed", "--format", "csv", "--soft"});
+    EXPECT_EQ(made.out, "set: 1 block in csv\n");
     // Another algorithm gives other ratios.
     auto manifest = nlohmann::json::parse(morvik.read("set/manifest.json"));
     manifest["parameters"]["algorithm"] = "max-log";
