@@ -4,6 +4,7 @@
 #include <iostream>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
@@ -103,9 +104,20 @@ int check(const std::string& folder)
     return success;
 }
 
-int run(const Options& options)
+/// A set tells by itself what it was made with.
+void expectNoOtherThanCheck(const CLI::App& command)
+{
+    for (const CLI::Option* const option : command.get_options()) {
+        if (option->count() > 0 && option->get_name() != "--check") {
+            throw simulation::Error(option->get_name() + " is for making a set, --check takes all from the manifest");
+        }
+    }
+}
+
+int run(const CLI::App& command, const Options& options)
 {
     if (!options.checked.empty()) {
+        expectNoOtherThanCheck(command);
         return check(options.checked);
     }
     if (options.output.empty() || options.settings.blockSizes.empty()) {
@@ -199,8 +211,8 @@ Command addVectors(CLI::App& app)
     addDecoderOptions(*command, options->decoder);
     addFileOptions(*command, options->settings);
     command->footer(explanation);
-    const auto work = [options] {
-        return run(*options);
+    const auto work = [options, command] {
+        return run(*command, *options);
     };
     return {command, work};
 }

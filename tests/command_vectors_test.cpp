@@ -35,6 +35,8 @@ TEST_F(CommandVectors, MakesASetAndChecksIt)
     const CommandResult checked = vectors({"--check", "set"});
     EXPECT_EQ(checked.status, 0) << checked.err;
     EXPECT_EQ(checked.out, "set: 4 blocks in memh, all as the model decodes them\n");
+    const CommandResult one = vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed"});
+    EXPECT_EQ(one.out, "set: 1 block in memh\n");
 }
 
 TEST_F(CommandVectors, WritesWhatDecodeReads)
@@ -125,6 +127,9 @@ TEST_F(CommandVectors, RefusesWhatIsNotAllowed)
     expectRefused({"--out", "set"}, required);
     expectRefused({"--block-size", "40"}, required);
     expectRefused({"--out", "set", "--check", "set"}, "--out excludes --check" + help);
+    expectRefused({"--check", "set", "--num-pu", "8"},
+                  "--num-pu is for making a set, --check takes all from the manifest");
+    expectRefused({"--check", "set", "--soft"}, "--soft is for making a set, --check takes all from the manifest");
     expectRefused(
         {"--out", "set", "--block-size", "41"},
         "--block-size: \"41\" is not allowed, the nearest block sizes of 3GPP TS 36.212 are 40 and 48" + help);
