@@ -1,16 +1,16 @@
 // morvik: the command line of the decoder model.
 #include <iostream>
 
-#include "Ber.h"
 #include "CommandLine.h"
-#include "Compare.h"
 #include "Decode.h"
-#include "Doctor.h"
-#include "Info.h"
-#include "Merge.h"
-#include "SelfTest.h"
 #include "Trace.h"
 #include "Vectors.h"
+#include "ber/Ber.h"
+#include "ber/Merge.h"
+#include "compare/Compare.h"
+#include "doctor/Doctor.h"
+#include "info/Info.h"
+#include "selftest/SelfTest.h"
 
 int main(int argc, char** argv)
 {

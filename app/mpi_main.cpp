@@ -5,10 +5,10 @@
 #include <memory>
 #include <optional>
 
-#include "Ber.h"
-#include "BerOptions.h"
 #include "CommandLine.h"
-#include "Interruption.h"
+#include "ber/Ber.h"
+#include "ber/BerOptions.h"
+#include "ber/Interruption.h"
 #include "simulation/Error.h"
 #include "simulation/MpiWorkers.h"
 #include "simulation/MpiWorld.h"

@@ -1,5 +1,5 @@
 // BlockLayout: segments, windows and their order are those of docs/arithmetic.md, rules 17 and 18.
-#include "BlockLayout.h"
+#include "info/BlockLayout.h"
 
 #include <gtest/gtest.h>
 

@@ -1,12 +1,12 @@
 // Diagnosis: each mistake and pair of mistakes is found, and noise is not taken for one.
-#include "Diagnosis.h"
+#include "doctor/Diagnosis.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <set>
 
-#include "DiagnosisText.h"
+#include "doctor/DiagnosisText.h"
 #include "support/Accidents.h"
 
 namespace {

@@ -1,5 +1,5 @@
 // Evidence: what is said of the signs under all mistakes at once is what undoing each of them gives.
-#include "Evidence.h"
+#include "doctor/Evidence.h"
 
 #include <gtest/gtest.h>
 

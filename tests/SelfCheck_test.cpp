@@ -1,5 +1,5 @@
 // SelfCheck: it passes, and it fails for every wrong bit, ratio and digest.
-#include "SelfCheck.h"
+#include "selftest/SelfCheck.h"
 
 #include <gtest/gtest.h>
 

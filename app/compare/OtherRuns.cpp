@@ -6,9 +6,9 @@
 #include <vector>
 
 #include "Files.h"
-#include "Mistakes.h"
 #include "SoftValueReader.h"
 #include "comparison/Model.h"
+#include "doctor/Mistakes.h"
 #include "simulation/Point.h"
 
 namespace morvik {
