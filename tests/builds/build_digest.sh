@@ -4,12 +4,12 @@
 set -euo pipefail
 compile=("$1" -std=c++17 "$2" -msse2 -mfpmath=sse "$3")
 program=$4
-tests=$(cd "$(dirname "$0")" && pwd)
+tests=$(cd "$(dirname "$0")/.." && pwd)
 root=$(dirname "$tests")
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
 "${compile[@]}" -DMORVIK_LANES=lanes_generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
 "${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp \
-    "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/digest.cpp" \
+    "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/builds/digest.cpp" \
     "$work/kernels.o" -o "$program"

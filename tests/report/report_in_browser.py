@@ -11,7 +11,7 @@ import tempfile
 import unittest
 
 sys.dont_write_bytecode = True  # the tree stays as it is
-from support.browser import Browser
+from browser import Browser
 
 EXAMPLE = pathlib.Path(sys.argv[1]).resolve()
 SCREENSHOTS = pathlib.Path(sys.argv[2]) if len(sys.argv) > 2 else None
