@@ -1,11 +1,28 @@
 // Arguments: what option values are allowed, and how a refusal reads.
 #include "Arguments.h"
 
+#include <iterator>
+#include <sstream>
+
 #include "Text.h"
 #include "simulation/Thousandths.h"
 #include "standard/BlockSizes.h"
 
 namespace morvik {
+
+namespace {
+
+/// The name of a validator is nowhere shown: it carries the words to offer.
+std::string wordsAsName(const std::vector<std::string>& words)
+{
+    std::string name;
+    for (const std::string& word : words) {
+        name += (name.empty() ? "" : " ") + word;
+    }
+    return name;
+}
+
+}  // namespace
 
 CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max)
 {
@@ -34,7 +51,38 @@ CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& cho
         }
         return shown(text) + " is not allowed, allowed are " + allowed;
     };
-    return CLI::Validator(check, "");
+    std::vector<std::string> words;
+    for (const auto& [choice, value] : choices) {
+        words.push_back(choice);
+    }
+    return CLI::Validator(check, "", wordsAsName(words));
+}
+
+CLI::Validator offer(const std::vector<std::string>& words)
+{
+    return CLI::Validator().name(wordsAsName(words));
+}
+
+std::vector<std::string> blockSizeWords()
+{
+    std::vector<std::string> words;
+    for (const auto& size : standard::blockSizes) {
+        words.push_back(std::to_string(size.K));
+    }
+    return words;
+}
+
+std::vector<std::string> offered(CLI::Option& option)
+{
+    std::vector<std::string> words;
+    try {
+        for (int i = 0;; ++i) {
+            std::istringstream name(option.get_validator(i)->get_name());
+            words.insert(words.end(), std::istream_iterator<std::string>(name), {});
+        }
+    } catch (const CLI::OptionNotFound&) {  // how the option says that there are no more validators
+    }
+    return words;
 }
 
 void refuse(const std::string& option, const std::string& text, const std::string& allowed)

@@ -18,6 +18,16 @@ CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max);
 /// Allows the first texts of the pairs, and replaces each by its second. For CLI::Option::transform.
 CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& choices);
 
+/// Allows everything, and leaves the words for offered(). For CLI::Option::check of options that read their values
+/// themselves.
+CLI::Validator offer(const std::vector<std::string>& words);
+
+/// The block sizes, for offer().
+std::vector<std::string> blockSizeWords();
+
+/// The words that a shell may offer as the option's value, from oneOf() or offer().
+std::vector<std::string> offered(CLI::Option& option);
+
 /// Throws CLI::ValidationError: `text` is not allowed for the option, and what is instead.
 [[noreturn]] void refuse(const std::string& option, const std::string& text, const std::string& allowed);
 

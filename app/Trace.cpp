@@ -71,6 +71,14 @@ void appendSignals(const std::string& text, std::vector<unsigned>& signals)
     }
 }
 
+/// What appendSignals() knows by name.
+std::vector<std::string> signalWords()
+{
+    std::vector<std::string> words(passSignals.begin(), passSignals.end());
+    words.insert(words.end(), {"g", "alpha", "beta"});
+    return words;
+}
+
 void appendUnit(const std::string& text, std::vector<std::uint32_t>& units)
 {
     const auto unit = parseInteger<std::uint32_t>(text);
@@ -182,6 +190,7 @@ void addSelectionOptions(CLI::App& command, Options& options)
         ->type_name("A:B");
     addListOption(
         command, "--signals", options.selection.signals, appendSignals, "Which signals to write; all without it")
+        ->check(offer(signalWords()))
         ->type_name("NAME[,NAME...]");
     addListOption(command, "--units", options.selection.units, appendUnit, "Whose values to write; all without it")
         ->type_name("N[,N...]");

@@ -129,6 +129,7 @@ int run(const CLI::App& command, const Options& options)
 void addBlockOptions(CLI::App& command, vectors::Settings& settings)
 {
     addListOption(command, "--block-size", settings.blockSizes, appendBlockSize, "Bits of a block, K")
+        ->check(offer(blockSizeWords()))
         ->type_name("K[,K...]");
     command.add_option("--blocks", settings.blocks, "Random blocks of each size")
         ->transform(integerFrom(0, 1000000))
@@ -168,6 +169,7 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
         formats.push_back(text);
     };
     addListOption(command, "--format", settings.formats, append, "Formats of the files: memh, csv, npy, c")
+        ->check(offer({"memh", "csv", "npy", "c"}))
         ->type_name("FORMAT[,FORMAT...]")
         ->default_str("memh");
     command.add_option("--width", settings.width, "Bits of a soft value in the files: 8, or 16 with the sign extended")

@@ -6,7 +6,7 @@
 #include <optional>
 
 #include "CommandLine.h"
-#include "ber/Ber.h"
+#include "Programs.h"
 #include "ber/BerOptions.h"
 #include "ber/Interruption.h"
 #include "simulation/Error.h"
@@ -27,17 +27,11 @@ unsigned threadsOf(const BerOptions& options)
 
 int runAsRankZero(MpiWorld& world, int argc, const char* const* argv)
 {
-    CLI::App app("The error-rate simulation of the morvik LTE turbo decoder, on many machines.", "morvik-mpi");
-    app.set_version_flag("--version", "morvik-mpi " MORVIK_VERSION, "Print the version and exit");
-    app.require_subcommand(0, 1);
-    app.footer("Example:\n  mpirun -n 16 morvik-mpi ber --block-size 512 --output k512.csv");
     const auto makeWorkers = [&world](const BerOptions& options, const Plan& plan) {
         return std::make_unique<simulation::MpiWorkers>(world, plan, threadsOf(options), options.instructionSet);
     };
-    // What mpirun gives its processes as standard output is a terminal always, wherever its own goes.
-    const morvik::Command ber = morvik::addBer(app, {"morvik-mpi ber", makeWorkers, false});
-    ber.arguments->get_option("--threads")->description("Threads of each rank, by default 1");
-    const int status = morvik::runCommandLine(app, {ber}, argc, argv);
+    const morvik::Program program = morvik::morvikMpiProgram(makeWorkers);
+    const int status = morvik::runCommandLine(*program.arguments, program.commands, argc, argv);
 
     // The signal may have come because a rank is dead. The time is part of the second that mpirun grants.
     const bool isInterrupted = morvik::Interruption::signal() != 0;

@@ -1,5 +1,5 @@
 # What `cmake --install` puts where: the library with its headers, the CMake package and the pkg-config file by which
-# others find it, and the command. All paths are relative to each other, so an installed tree can be moved. Where the
+# others find it, and the command with its manual pages and completions. All paths are relative to each other, so an installed tree can be moved. Where the
 # library alone is built, `cmake --install FOLDER --component library` installs all but the command.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
@@ -40,6 +40,11 @@ endif()
 file(RELATIVE_PATH to_libraries ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LIBDIR})
 set_target_properties(${commands} PROPERTIES INSTALL_RPATH "$ORIGIN/${to_libraries}")
 install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT command)
+
+# Manual pages and completions.
+foreach(command IN LISTS commands)
+    install(DIRECTORY ${MORVIK_REFERENCE_DIR}/${command}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} COMPONENT command)
+endforeach()
 
 install(EXPORT ${library} NAMESPACE morvik:: FILE ${library}Config.cmake DESTINATION ${package_dir})
 # A consumer of the other word size is told so, rather than failing in its linker.

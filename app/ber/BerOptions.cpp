@@ -179,9 +179,11 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
 {
     addListOption(command, "--block-size", sweep.blockSizes, appendBlockSize, "Bits of a block, K")
         ->required()
+        ->check(offer(blockSizeWords()))
         ->type_name("K[,K...]");
     sweep.numPus = {4};
     addListOption(command, "--num-pu", sweep.numPus, appendNumPu, "Parallel processing units: 2, 4 or 8")
+        ->check(offer({"2", "4", "8"}))
         ->type_name("N[,N...]")
         ->default_str("4");
     sweep.algorithms = {1};
@@ -190,6 +192,7 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
                   sweep.algorithms,
                   appendAlgorithm,
                   "0 or max-log: max-log-MAP; 1 or scaled: extrinsic values times 0.75; 2 or table: correction table")
+        ->check(offer({"0", "1", "2", "max-log", "scaled", "table"}))
         ->type_name("TYPE[,TYPE...]")
         ->default_str("scaled");
     sweep.scaleOptions = {std::nullopt};
@@ -198,6 +201,7 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
                   sweep.scaleOptions,
                   appendScale,
                   "Steps of the soft values for amplitude 1; auto: what suits the algorithm and Eb/N0")
+        ->check(offer({"auto"}))
         ->type_name("X[,X...]")
         ->default_str("auto");
     sweep.iterations = {8};
@@ -260,6 +264,7 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
         .add_option("--instruction-set",
                     options.instructionSet,
                     "avx512, avx2, ssse3, generic or component; by default the fastest. All give the same results")
+        ->check(offer({"avx512", "avx2", "ssse3", "generic", "component"}))
         ->type_name("NAME");
     CLI::Option* const output =
         command.add_option("--output", options.output, "Results, as CSV or JSON by the ending .csv or .json")

@@ -66,6 +66,8 @@ The runs have the same seed and were made by the same version. Rows of the same 
 become one, if they have no frames in common: 'morvik ber --frames' divides them. One
 file alone is drawn as it is.
 
+Exit status: 0 joined, 2 bad input or usage.
+
 Example: two halves of a simulation, made anywhere
   morvik ber --block-size 512 --ebn0 1.4 --frames 0:500000 --output a.csv
   morvik ber --block-size 512 --ebn0 1.4 --frames 500000:1000000 --output b.csv

@@ -229,6 +229,7 @@ Command addInfo(CLI::App& app)
 
     command->add_option("K", options->K, "Block size in bits; without it, all block sizes")
         ->transform(integerFrom(0, UINT32_MAX))
+        ->check(offer(blockSizeWords()))
         ->type_name("");
     command->add_flag("--table", options->table, "Print the interleaver as CSV instead; with --json, add it");
     command->add_flag("--json", options->json, "Print a JSON object instead of text, with all windows in order");

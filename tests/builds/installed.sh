@@ -22,6 +22,10 @@ fi
 libraries=$(ldd "$prefix/bin/morvik")
 [[ "$libraries" == *"$prefix/bin/../lib/libmorvik_v1_0_bitacc_cmodel.so.1"* ]] || fail "The command uses another library"
 
+for file in man/man1/morvik-decode.1 bash-completion/completions/morvik zsh/site-functions/_morvik; do
+    [ -s "$prefix/share/$file" ] || fail "share/$file is not installed"
+done
+
 echo "As a CMake project"
 "$cmake" -S "$source/examples" -B "$folder/cmake" -DCMAKE_PREFIX_PATH="$prefix" >/dev/null
 "$cmake" --build "$folder/cmake" >/dev/null

@@ -1,0 +1,62 @@
+// Programs: what the commands `morvik` and `morvik-mpi` take.
+#include "Programs.h"
+
+#include <string>
+
+#include "Decode.h"
+#include "Trace.h"
+#include "Vectors.h"
+#include "ber/Merge.h"
+#include "compare/Compare.h"
+#include "doctor/Doctor.h"
+#include "info/Info.h"
+#include "selftest/SelfTest.h"
+
+namespace morvik {
+
+namespace {
+
+std::unique_ptr<CLI::App> makeArguments(const std::string& name, const std::string& description)
+{
+    auto arguments = std::make_unique<CLI::App>(description, name);
+    arguments->set_version_flag("--version", name + " " MORVIK_VERSION, "Print the version and exit");
+    arguments->require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
+    return arguments;
+}
+
+}  // namespace
+
+Program morvikProgram()
+{
+    Program program{
+        makeArguments("morvik", "The bit-accurate model of the morvik LTE turbo decoder, at the command line."), {}};
+    CLI::App& app = *program.arguments;
+    app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
+    program.commands = {
+        addDecode(app),
+        addBer(app),
+        addMerge(app),
+        addVectors(app),
+        addTrace(app),
+        addCompare(app),
+        addDoctor(app),
+        addInfo(app),
+        addSelfTest(app),
+    };
+    return program;
+}
+
+Program morvikMpiProgram(const decltype(BerMeans::makeWorkers)& makeWorkers)
+{
+    Program program{
+        makeArguments("morvik-mpi", "The error-rate simulation of the morvik LTE turbo decoder, on many machines."),
+        {}};
+    CLI::App& app = *program.arguments;
+    app.footer("Example:\n  mpirun -n 16 morvik-mpi ber --block-size 512 --output k512.csv");
+    // What mpirun gives its processes as standard output is a terminal always, wherever its own goes.
+    program.commands = {addBer(app, {"morvik-mpi ber", makeWorkers, false})};
+    program.commands.front().arguments->get_option("--threads")->description("Threads of each rank, by default 1");
+    return program;
+}
+
+}  // namespace morvik

@@ -1,0 +1,27 @@
+// Programs: what the commands `morvik` and `morvik-mpi` take. Their mains run them; pages and completions describe
+// them.
+#ifndef MORVIK_PROGRAMS_H
+#define MORVIK_PROGRAMS_H
+
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <vector>
+
+#include "Command.h"
+#include "ber/Ber.h"
+
+namespace morvik {
+
+struct Program {
+    std::unique_ptr<CLI::App> arguments;
+    std::vector<Command> commands;
+};
+
+Program morvikProgram();
+
+/// `makeWorkers` is as in BerMeans.
+Program morvikMpiProgram(const decltype(BerMeans::makeWorkers)& makeWorkers);
+
+}  // namespace morvik
+
+#endif

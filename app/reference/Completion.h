@@ -1,0 +1,19 @@
+// Completion: what lets shells complete the arguments of a program.
+#ifndef MORVIK_REFERENCE_COMPLETION_H
+#define MORVIK_REFERENCE_COMPLETION_H
+
+#include <string>
+
+#include "Facts.h"
+
+namespace reference {
+
+/// A function for bash, on those of the package bash-completion.
+std::string bashCompletion(const CommandFacts& program);
+
+/// A function for the completion system of zsh.
+std::string zshCompletion(const CommandFacts& program);
+
+}  // namespace reference
+
+#endif

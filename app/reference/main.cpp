@@ -1,0 +1,53 @@
+// morvik_reference: writes the manual pages and the completions of the commands, from the options that they take.
+//   morvik_reference FOLDER     writes FOLDER/PROGRAM/share/..., as it is to be installed
+#include <exception>
+#include <filesystem>
+#include <fstream>
+#include <iostream>
+#include <stdexcept>
+
+#include "Completion.h"
+#include "ManualPage.h"
+#include "Programs.h"
+
+namespace {
+
+namespace fs = std::filesystem;
+
+void write(const fs::path& file, const std::string& text)
+{
+    fs::create_directories(file.parent_path());
+    if (!(std::ofstream(file, std::ios::binary) << text << std::flush)) {
+        throw std::runtime_error(file.string() + ": cannot be written");
+    }
+}
+
+void writeReference(const fs::path& folder, const morvik::Program& program)
+{
+    const reference::CommandFacts facts = reference::factsOf(*program.arguments);
+    const fs::path share = folder / facts.name / "share";
+    fs::remove_all(folder / facts.name);  // pages of subcommands that are no more
+    for (const auto& [name, page] : manualPages(facts, MORVIK_VERSION)) {
+        write(share / "man/man1" / name, page);
+    }
+    write(share / "bash-completion/completions" / facts.name, bashCompletion(facts));
+    write(share / "zsh/site-functions" / ('_' + facts.name), zshCompletion(facts));
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    if (argc != 2) {
+        std::cerr << "morvik_reference FOLDER" << std::endl;
+        return morvik::badInputOrUsage;
+    }
+    try {
+        writeReference(argv[1], morvik::morvikProgram());
+        writeReference(argv[1], morvik::morvikMpiProgram(nullptr));
+    } catch (const std::exception& error) {
+        std::cerr << "morvik_reference: " << error.what() << std::endl;
+        return morvik::badInputOrUsage;
+    }
+    return morvik::success;
+}
