@@ -1,6 +1,7 @@
 # What `cmake --install` puts where: the library with its headers, the CMake package and the pkg-config file by which
-# others find it, and the command with its manual pages and completions. All paths are relative to each other, so an installed tree can be moved. Where the
-# library alone is built, `cmake --install FOLDER --component library` installs all but the command.
+# others find it, the command with its manual pages and completions, and the pages of docs/. All paths are relative to
+# each other, so an installed tree can be moved. Where the library alone is built,
+# `cmake --install FOLDER --component library` installs it without the others. packaging/ has Debian's layout.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 set(library morvik_v1_0_bitacc_cmodel)
@@ -16,21 +17,22 @@ install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 
 # The class headers, and those that they need. Their names are common: they keep to a folder of their own.
 set(classes_dir ${CMAKE_INSTALL_INCLUDEDIR}/morvik_v1_0_classes)
-install(FILES
-    src/Arithmetic.h
-    src/Misc.h
-    src/T8.h
-    src/TCalculationEngine.h
-    src/TCalculationEngineMod.h
-    src/TCalculationEngineModBase.h
-    src/TCalculationEngineModHash.h
-    src/TDecoder.h
-    src/TDecoder3G.h
-    src/TDecoder3GPU.h
-    src/TInterleaver.h
-    src/TInterleaver3GPPLTE.h
-    src/TNumberFormat.h
-    DESTINATION ${classes_dir})
+set(MORVIK_CLASS_HEADERS
+    Arithmetic.h
+    Misc.h
+    T8.h
+    TCalculationEngine.h
+    TCalculationEngineMod.h
+    TCalculationEngineModBase.h
+    TCalculationEngineModHash.h
+    TDecoder.h
+    TDecoder3G.h
+    TDecoder3GPU.h
+    TInterleaver.h
+    TInterleaver3GPPLTE.h
+    TNumberFormat.h)
+list(TRANSFORM MORVIK_CLASS_HEADERS PREPEND ${PROJECT_SOURCE_DIR}/src/)
+install(FILES ${MORVIK_CLASS_HEADERS} DESTINATION ${classes_dir})
 target_include_directories(morvik_classes INTERFACE $<INSTALL_INTERFACE:${classes_dir}>)
 
 set(commands morvik)
@@ -41,10 +43,12 @@ file(RELATIVE_PATH to_libraries ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FUL
 set_target_properties(${commands} PROPERTIES INSTALL_RPATH "$ORIGIN/${to_libraries}")
 install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT command)
 
-# Manual pages and completions.
+# Manual pages, completions, and the pages that they refer to.
 foreach(command IN LISTS commands)
     install(DIRECTORY ${MORVIK_REFERENCE_DIR}/${command}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} COMPONENT command)
 endforeach()
+install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT documents
+    FILES_MATCHING PATTERN *.md PATTERN *.svg PATTERN *.png)
 
 install(EXPORT ${library} NAMESPACE morvik:: FILE ${library}Config.cmake DESTINATION ${package_dir})
 # A consumer of the other word size is told so, rather than failing in its linker.
