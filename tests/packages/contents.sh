@@ -1,0 +1,91 @@
+#!/usr/bin/env bash
+# Makes the packages of a build and looks into them: by lintian, by what they depend on, and by use of what they hold,
+# unpacked in a folder. `scripts/ci.sh packages` installs them in a system of their own.
+#   contents.sh BUILD SOURCE CPACK
+set -euo pipefail
+build=$1 source=$2 cpack=$3
+folder=$(mktemp -d)
+trap 'rm -rf "$folder"' EXIT
+fail() {
+    echo "$*" >&2
+    exit 1
+}
+
+"$cpack" --config "$build/CPackConfig.cmake" -B "$folder" >"$folder/log" 2>&1 || { cat "$folder/log"; fail "cpack fails"; }
+cd "$folder"
+
+version=$("$build/bin/morvik" --version | sed 's/^morvik //')-1
+library=libmorvik-v1-0-bitacc-cmodel1 development=libmorvik-v1-0-bitacc-cmodel-dev
+case $(file -L "$build/bin/morvik") in
+    *32-bit*)
+        architecture=i386
+        expected=("$library" "$development" morvik morvik-simulators) ;;
+    *)
+        architecture=amd64
+        expected=("$library" "$development" morvik morvik-mpi morvik-simulators python3-morvik octave-morvik morvik-doc) ;;
+esac
+names=()
+for package in *.deb; do
+    names+=("$(dpkg-deb --field "$package" Package)")
+    [ "$(dpkg-deb --field "$package" Version)" = "$version" ] || fail "$package is not of version $version"
+done
+diff <(printf '%s\n' "${expected[@]}" | sort) <(printf '%s\n' "${names[@]}" | sort) || fail "These are other packages"
+
+echo "lintian"
+lintian --fail-on error,warning ./*.deb 2>&1 || fail "lintian finds faults"
+
+field() {
+    dpkg-deb --field "$1_${version}_$architecture.deb" "$2"
+}
+depends() {
+    [[ ", $(field "$1" Depends)," == *", $2"[\ ,]* ]] || fail "$1 does not depend on $2: $(field "$1" Depends)"
+}
+depends "$library" libstdc++6
+depends "$development" "$library"
+depends morvik "$library"
+[ "$(field "$library" Multi-Arch)" = same ] || fail "The libraries of two architectures exclude each other"
+if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) == *lib*32* ]]; then
+    fail "A package depends on 32-bit libraries in packages for 64-bit machines"
+fi
+if [[ "$(field morvik Depends)" == *mpi* ]]; then
+    fail "The command drags MPI along"
+fi
+
+for package in *.deb; do
+    dpkg-deb --extract "$package" root
+done
+multiarch=${architecture/amd64/x86_64}-linux-gnu
+export LD_LIBRARY_PATH=$folder/root/usr/lib/$multiarch
+share=$folder/root/usr/share
+
+echo "The command"
+vectors=$source/tests/data/vectors
+root/usr/bin/morvik decode "$vectors/k40.csv" --num-pu 8 --iterations 6 --reference "$vectors/k40.bits" --output bits
+cmp bits "$vectors/k40.bits"
+for file in man/man1/morvik.1.gz man/man1/morvik-ber.1.gz bash-completion/completions/morvik zsh/vendor-completions/_morvik; do
+    [ -s "$share/$file" ] || fail "There is no share/$file"
+done
+
+echo "The examples, by pkg-config"
+mkdir programs
+PKG_CONFIG_LIBDIR=$LD_LIBRARY_PATH/pkgconfig OUT=$folder/programs make -s -C "$share/doc/$development/examples" check
+
+if [ "$architecture" = amd64 ]; then
+    depends morvik-mpi libopenmpi3
+    depends python3-morvik python3-numpy
+    depends octave-morvik octave-abi-57
+    echo "Python"
+    PYTHONPATH=$folder/root/usr/lib/python3/dist-packages /usr/bin/python3 -c "
+import morvik, numpy
+streams = morvik.encode(numpy.ones((1, 40), dtype=numpy.uint8))
+print(morvik.__file__)
+assert morvik.__version__ == '${version%-1}'
+" | grep -F "$folder/root"
+    echo "Octave"
+    functions=$(dirname "$(find root/usr/lib -name morvik_decode.m)")
+    octave-cli --no-history --norc --path "$functions" --eval "
+        bits = rand(40, 3) < 0.5;
+        [a, b, c] = morvik_encode(bits);
+        assert(isequal(morvik_decode(16 * (2 * a - 1), 16 * (2 * b - 1), 16 * (2 * c - 1)), bits));
+        printf('%s\n', which('morvik_decode'))" | grep -F "$functions"
+fi
