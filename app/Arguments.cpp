@@ -52,6 +52,7 @@ CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& cho
         return shown(text) + " is not allowed, allowed are " + allowed;
     };
     std::vector<std::string> words;
+    words.reserve(choices.size());
     for (const auto& [choice, value] : choices) {
         words.push_back(choice);
     }
@@ -66,6 +67,7 @@ CLI::Validator offer(const std::vector<std::string>& words)
 std::vector<std::string> blockSizeWords()
 {
     std::vector<std::string> words;
+    words.reserve(standard::blockSizes.size());
     for (const auto& size : standard::blockSizes) {
         words.push_back(std::to_string(size.K));
     }

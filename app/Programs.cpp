@@ -1,8 +1,6 @@
 // Programs: what the commands `morvik` and `morvik-mpi` take.
 #include "Programs.h"
 
-#include <string>
-
 #include "Decode.h"
 #include "Trace.h"
 #include "Vectors.h"
@@ -14,22 +12,16 @@
 
 namespace morvik {
 
-namespace {
-
-std::unique_ptr<CLI::App> makeArguments(const std::string& name, const std::string& description)
+Program::Program(const std::string& name, const std::string& description)
+    : arguments(std::make_unique<CLI::App>(description, name))
 {
-    auto arguments = std::make_unique<CLI::App>(description, name);
     arguments->set_version_flag("--version", name + " " MORVIK_VERSION, "Print the version and exit");
     arguments->require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
-    return arguments;
 }
-
-}  // namespace
 
 Program morvikProgram()
 {
-    Program program{
-        makeArguments("morvik", "The bit-accurate model of the morvik LTE turbo decoder, at the command line."), {}};
+    Program program("morvik", "The bit-accurate model of the morvik LTE turbo decoder, at the command line.");
     CLI::App& app = *program.arguments;
     app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
     program.commands = {
@@ -48,9 +40,7 @@ Program morvikProgram()
 
 Program morvikMpiProgram(const decltype(BerMeans::makeWorkers)& makeWorkers)
 {
-    Program program{
-        makeArguments("morvik-mpi", "The error-rate simulation of the morvik LTE turbo decoder, on many machines."),
-        {}};
+    Program program("morvik-mpi", "The error-rate simulation of the morvik LTE turbo decoder, on many machines.");
     CLI::App& app = *program.arguments;
     app.footer("Example:\n  mpirun -n 16 morvik-mpi ber --block-size 512 --output k512.csv");
     // What mpirun gives its processes as standard output is a terminal always, wherever its own goes.

@@ -5,6 +5,7 @@
 
 #include <CLI/CLI.hpp>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "Command.h"
@@ -13,6 +14,8 @@
 namespace morvik {
 
 struct Program {
+    Program(const std::string& name, const std::string& description);
+
     std::unique_ptr<CLI::App> arguments;
     std::vector<Command> commands;
 };

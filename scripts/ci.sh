@@ -2,7 +2,7 @@
 # Runs at a desk what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads fuzz coverage tests, and only when they are named:
-# abi-renew mutate
+# abi-renew mutate packages
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -131,6 +131,12 @@ stage_mutate() {
     scripts/mutate
 }
 
+# Not without being named, either: it makes a Debian system from downloads.
+stage_packages() {
+    scripts/packages
+    tests/packages/clean_root.sh build/packages
+}
+
 stage_tests() {
     ./test
 }
@@ -139,7 +145,7 @@ scripts/setup --checks --tests
 [ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads fuzz coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads fuzz coverage tests abi-renew mutate" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads fuzz coverage tests abi-renew mutate packages" >&2
         exit 2
     fi
     echo "== $stage"

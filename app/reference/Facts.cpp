@@ -19,6 +19,7 @@ std::string mainName(const CLI::Option& option)
 std::vector<std::string> mainNames(const std::set<CLI::Option*>& options)
 {
     std::vector<std::string> names;
+    names.reserve(options.size());
     for (const CLI::Option* const option : options) {
         names.push_back(mainName(*option));
     }
