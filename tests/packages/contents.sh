@@ -54,6 +54,12 @@ fi
 for package in *.deb; do
     dpkg-deb --extract "$package" root
 done
+if find root/usr/bin root/usr/lib -type f -exec readelf -d {} + 2>/dev/null | grep -E 'RPATH|RUNPATH'; then
+    fail "A package looks for libraries where it was built for"
+fi
+if grep -rlF -e "$build" -e "$source" root; then
+    fail "These files know where they were built"
+fi
 multiarch=${architecture/amd64/x86_64}-linux-gnu
 export LD_LIBRARY_PATH=$folder/root/usr/lib/$multiarch
 share=$folder/root/usr/share
