@@ -13,5 +13,5 @@ tools=gcc-multilib,g++-multilib,make,cmake,pkg-config,iverilog
 mmdebstrap --quiet --variant=apt --architectures=amd64,i386 --include="$tools" \
     --customize-hook='mkdir "$1/packages"' \
     --customize-hook="cp '$packages'/*.deb '$vectors/k40.csv' '$vectors/k40.bits' '$here/in_clean_root.sh' \"\$1/packages\"" \
-    --customize-hook='chroot "$1" sh /packages/in_clean_root.sh >&2' \
+    --customize-hook='chroot "$1" env -i PATH=/usr/sbin:/usr/bin:/sbin:/bin sh /packages/in_clean_root.sh >&2' \
     "$VERSION_CODENAME" /dev/null "deb http://deb.debian.org/debian $VERSION_CODENAME main"
