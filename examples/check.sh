@@ -1,10 +1,12 @@
 #!/bin/sh
-# Runs a program and compares what it prints on its standard output with the expected text.
-#   check.sh PROGRAM EXPECTED
+# Runs a command and compares what it prints on its standard output with the expected text.
+#   check.sh EXPECTED COMMAND...
 set -eu
-printed=$("$1")
-if [ "$printed" != "$(cat "$2")" ]; then
-    printf '%s printed\n%s\nand not\n%s\n' "$1" "$printed" "$(cat "$2")" >&2
+expected=$1
+shift
+printed=$("$@")
+if [ "$printed" != "$(cat "$expected")" ]; then
+    printf '%s printed\n%s\nand not\n%s\n' "$*" "$printed" "$(cat "$expected")" >&2
     exit 1
 fi
-echo "$(basename "$1"): as expected"
+echo "$(basename "$expected" .expected): as expected"
