@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# What scaling and the correction table are worth: the Eb/N0 at which each algorithm comes down to one wrong block in ten, for some
-# block sizes, from one sweep. Run again, it takes up the results that are there.
+# What scaling and the correction table are worth: the Eb/N0 at which each algorithm comes down to one wrong block in
+# ten, for some block sizes, from one sweep. Run again, it takes up the results that are there.
 #
 #   MORVIK=build/x86_64/bin/morvik examples/sweep.sh [RESULTS.csv]
 set -euo pipefail
