@@ -1,9 +1,10 @@
 #!/usr/bin/env python3
-"""Draws the pictures of docs/algorithm.md and docs/arithmetic.md, SVG files beside this one.
+"""Draws the pictures of docs/algorithm.md, docs/arithmetic.md and CONTRIBUTING.md, SVG files beside this one.
 
     pictures.py [FOLDER]     FOLDER is where the pictures go, if not beside this file
 
 Interleaver, windows and border metrics are those of the model: build/x86_64/bin/morvik has to be built.
+The functions and files on a block's way are looked up in the sources.
 """
 
 import csv
@@ -309,6 +310,78 @@ def borders():
     return svg(int(right + 250), key + 124, elements)
 
 
+class Way:
+    """A column of stations: what happens, and the function that does it. The sources have it."""
+
+    def __init__(self, left, width):
+        self.left, self.middle, self.width = left, left + width / 2, width
+        self.elements = []
+
+    def station(self, y, what, *names):
+        for name in names:
+            file, _, functions = name.partition(": ")
+            source = (HERE.parent / file).read_text()
+            for function in functions.split(", "):
+                assert function in source, name
+        self.elements += box(self.left, y, self.width, 26 + 18 * len(names), what, *names)
+        return y + 26 + 18 * len(names)
+
+    def stations(self, y, *stations):
+        """One below the other; returns where each ends."""
+        ends = []
+        for number, station in enumerate(stations):
+            if number > 0:
+                self.elements.append(arrow(self.middle, y - 20, self.middle, y))
+            y = self.station(y, *station) + 20
+            ends.append(y - 20)
+        return ends
+
+    def again(self, top, bottom, label):
+        """Back from the end of a station to the beginning of an earlier one, on the right."""
+        x = self.left + self.width
+        self.elements += [f'<path d="M{x} {bottom} h18 V{top} h-18 m6 -4 l-6 4 l6 4" class="line"/>',
+                          text(x + 24, (top + bottom) / 2 + 5, label, "start", "small")]
+
+
+def flow():
+    """How a block travels: the way by the lanes, and that by the components."""
+    lanes, components, both = Way(20, 420), Way(560, 420), Way(290, 420)
+    end = both.stations(16, ("A call checks its arguments", "src/morvik_v1_0_bitacc_cmodel.cpp: bitacc_simulate",
+                             "src/morvik_v1_0_batch.cpp: batch_simulate, batch_count_errors",
+                             "src/SimulationCall.h: checkArguments"),
+                        ("Do the lanes take it?", "src/SimulationCall.cpp: lanesTake"))[-1]
+    top = end + 56
+    for way, label, side in ((lanes, "yes", -1), (components, "no: traced, preset, told so, or a wrong size", 1)):
+        both.elements += [f'<path d="M{both.middle + side * 60} {end} v22 H{way.middle}" class="line"/>',
+                          arrow(way.middle, end + 22, way.middle, top),
+                          text(way.middle + side * 8, end + 40, label, "end" if side < 0 else "start", "small")]
+
+    left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/SimulationCall.cpp: loadLanes",
+                                "src/LanePath.cpp: prepare, segmentCount, windowStarts"),
+                          ("A row for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
+                           "lanes/Transpose.h: loadRows"),
+                          ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
+                           "lanes/Kernels.cpp: decode, runPasses"),
+                          ("A pass, window by window", "lanes/Pass.h: runPass, forwardStep, backwardStep",
+                           "lanes/Rules.h: Greatest, Corrected", "lanes/Permute.h: Permutation"),
+                          ("Rows are spread over the caller's arrays", "lanes/LaneDecoder.cpp: decisions, ratios, spread"))
+    lanes.again(left[2] + 32, left[3] - 12, "2 x iterations")
+
+    right = components.stations(top, ("Values are clipped and joined", "src/SimulationCall.cpp: decodeByComponents"),
+                                ("Streams and tail, segments and windows", "src/TDecoder3G.cpp: decode, extract",
+                                 "src/TDecoder3GPU.cpp: allocate, buildSegments", "src/Segmentation.cpp: segmentCount, windowStarts"),
+                                ("A half-iteration", "src/TDecoder3G.cpp: calcSISO, calcIntrinsic, calcLLR, calcExtrinsic",
+                                 "src/TDecoder3GPU.cpp: calcGamma, calcAlpha, calcBeta",
+                                 "src/TCalculationEngineModBase.cpp: gamma, alpha, beta, llr"),
+                                ("Decisions", "src/TDecoder3G.cpp: hardDecisions"))
+    components.again(right[1] + 32, right[2] - 12, "2 x iterations")
+
+    bottom = both.station(max(left[-1], right[-1]) + 30, "The arithmetic of both, written once",
+                          "src/Trellis.h: branchSums, forwardStep, backwardStep, tailColumn",
+                          "src/Arithmetic.h: addWrap, subWrap, maxWrap, clip")
+    return svg(1100, bottom + 20, both.elements + lanes.elements + components.elements)
+
+
 if __name__ == "__main__":
-    for picture in (trellis, windows, turbo, interleaver, borders):
+    for picture in (trellis, windows, turbo, interleaver, borders, flow):
         (FOLDER / f"{picture.__name__}.svg").write_text(picture())
