@@ -10,6 +10,6 @@ work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
 "${compile[@]}" -DMORVIK_LANES=lanes_generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
-"${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp \
+"${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -DMORVIK_VERSION='""' -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp \
     "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/builds/digest.cpp" \
     "$work/kernels.o" -o "$program"

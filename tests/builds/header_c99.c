@@ -1,5 +1,5 @@
-/* The public header alone, as strict C99. */
-#include "morvik_v1_0_bitacc_cmodel.h"
+/* The public headers alone, as strict C99. */
+#include "morvik_v1_0_version.h"
 
 /* Fourteen words: three pointers and eleven integers, with the padding that the pointers ask for. */
 typedef char generics_have_fourteen_words

@@ -1,4 +1,4 @@
-// The public header alone, as C++.
-#include "morvik_v1_0_bitacc_cmodel.h"
+// The public headers alone, as C++.
+#include "morvik_v1_0_version.h"
 
 extern veltra_ip_morvik_v1_0_state* headerState;
