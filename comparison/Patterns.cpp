@@ -43,7 +43,7 @@ constexpr std::array<NamedMistake, 18> namedMistakes = {{
     {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
     {Mistake::aprioriInverse, "extrinsic values are taken by the inverse of the permutation (rule 15)"},
     {Mistake::aprioriBefore, "extrinsic values are taken by the interleaver's address for the step before (rule 15)"},
-    {Mistake::aprioriBehind, "extrinsic values are taken by the interleaver's address for the step behind (rule 15)"},
+    {Mistake::aprioriBehind, "extrinsic values are taken by the interleaver's address for the step after (rule 15)"},
     {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
     {Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"},
     {Mistake::parityNegated, "the sign of the parity is flipped (rule 5)"},
@@ -113,7 +113,7 @@ private:
         consider("values of the step before", faults, finding, [this](const Fault& fault) {
             return isOfOtherStep(fault, -1);
         });
-        consider("values of the step behind", faults, finding, [this](const Fault& fault) {
+        consider("values of the step after", faults, finding, [this](const Fault& fault) {
             return isOfOtherStep(fault, 1);
         });
     }

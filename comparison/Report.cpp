@@ -117,7 +117,7 @@ private:
     std::string bitText(const Place& place) const
     {
         if (place.step >= itsModel.windows.K) {
-            return "behind the bits";
+            return "after the bits";
         }
         const unsigned bit = codeOf(place.pass) == 0 ? place.step : itsModel.codes[1].order[place.step];
         return "bit " + std::to_string(bit) + " of the block";

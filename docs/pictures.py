@@ -211,7 +211,7 @@ class Block:
         return [self.passes[h][step][f"{kind}{state}"] for state in range(8)]
 
     def forward(self, h, step):
-        """The forward metrics behind a step."""
+        """The forward metrics after a step."""
         metrics, found = self.column(h, step, "alpha"), {}
         for state in range(8):
             for bit in (0, 1):
@@ -301,7 +301,7 @@ def borders():
                  f'<path d="M{left} {key + 22} h40" class="same"/>',
                  text(left + 50, key + 27, "from this pass: row 0 is computed before row 2", "start", "small")]
     k = segment_starts[0]
-    for line, (label, column) in enumerate(((f"computed behind step {k - 1}, half-iteration 0", block.forward(0, k - 1)),
+    for line, (label, column) in enumerate(((f"computed after step {k - 1}, half-iteration 0", block.forward(0, k - 1)),
                                             (f"the start of segment 1, half-iteration {now}", block.column(now, k, "alpha")))):
         y = key + 62 + 20 * line
         elements.append(text(left + 270, y, label, "end", "small"))

@@ -133,7 +133,7 @@ double parseSeconds(const std::string& option, const std::string& text)
     }
     const auto value = parseReal(number);
     if (!value || !(*value > 0 && *value < 1e9)) {
-        refuse(option, text, "allowed are numbers above 0, of seconds, or with s, m or h behind them");
+        refuse(option, text, "allowed are numbers above 0, of seconds, or with s, m or h after them");
     }
     return *value * unit;
 }

@@ -79,7 +79,7 @@ Explanation explain(Rows rows, std::size_t smallerSize)
                 "the tail is missing: a block of K bits has K + 4 rows",
                 "Write the twelve tail values into four more rows; all zeros, if they are not known."};
     case Rows::first:
-        return {"rows_behind", "rows follow behind the block", "Write the first K + 4 rows alone."};
+        return {"rows_behind", "rows follow after the block", "Write the first K + 4 rows alone."};
     case Rows::last:
         return {"rows_before", "rows stand before the block", "Write the last K + 4 rows alone."};
     case Rows::ends:

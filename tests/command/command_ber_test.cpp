@@ -381,7 +381,7 @@ TEST_F(Ber, RefusesValues)
     }
     for (const char* option : {"--max-time", "--checkpoint-interval"}) {
         for (const char* time : {"0", "-1", "5d", "m", "inf"}) {
-            expectNotAllowed(option, time, "allowed are numbers above 0, of seconds, or with s, m or h behind them");
+            expectNotAllowed(option, time, "allowed are numbers above 0, of seconds, or with s, m or h after them");
         }
     }
     expectNotAllowed("--stop-bler", "2", "allowed are the numbers from 0 to 1");

@@ -157,7 +157,7 @@ INSTANTIATE_TEST_SUITE_P(
         FaultCase{"apriori_missing", 512, 2, 1, 1, intrinsic, "of the pass before do not arrive"},
         FaultCase{"apriori_unpermuted", 512, 2, 1, 1, intrinsic, "without the interleaver's permutation"},
         FaultCase{"apriori_inverse", 512, 2, 1, 1, intrinsic, "by the inverse of the permutation"},
-        FaultCase{"apriori_behind", 512, 2, 1, 1, intrinsic, "by the interleaver's address for the step behind"},
+        FaultCase{"apriori_behind", 512, 2, 1, 1, intrinsic, "by the interleaver's address for the step after"},
         FaultCase{"systematic_unpermuted", 512, 2, 1, 0, intrinsic, "in the other code's order"},
         FaultCase{"extrinsic_unscaled", 512, 2, 1, 0, extrinsic, "the factor of 0.75 is missing"},
         FaultCase{"extrinsic_stuck_bit", 512, 2, 1, 0, extrinsic, "bit 0 is stuck at 1"},

@@ -200,7 +200,7 @@ std::vector<Accident> rowAccidents()
                  }
              }},
             {"rows",
-             "rows follow behind the block",
+             "rows follow after the block",
              [](SentFrame& f) {
                  insertRows(f, f.bits.size() + 4, 20);
              }},
