@@ -172,8 +172,8 @@ int run(Options options)
     return success;
 }
 
-constexpr char explanation[] = R"(
-FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
+constexpr char explanation[] =
+    R"(FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
 interleaved constituent code. 'text' is the library's own trace; it lacks the branch metrics,
 which the other formats have. 'vcd' has a scope for each unit and thread; a unit of its time is
 a trellis step. docs/trace.md tells the rest.

@@ -185,8 +185,8 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
     command.add_flag("--internal", settings.internal, "Expect every value of each pass, too");
 }
 
-constexpr char explanation[] = R"(
-The folder holds the tables 'blocks', 'stimulus' and 'expected', each as a file of every
+constexpr char explanation[] =
+    R"(The folder holds the tables 'blocks', 'stimulus' and 'expected', each as a file of every
 format, and manifest.json with all parameters and the sha256 of each file. After the random
 blocks come directed ones: extremes, ties, sizes at which the core cuts blocks in another
 way, tags at the edges. docs/vectors.md tells the layout.

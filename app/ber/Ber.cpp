@@ -142,8 +142,8 @@ int ber(const BerMeans& means, const BerOptions& options)
 }
 
 /// The end of the help text.
-constexpr char explanation[] = R"(
-Simulates every combination of the options that take lists, with BPSK over white Gaussian
+constexpr char explanation[] =
+    R"(Simulates every combination of the options that take lists, with BPSK over white Gaussian
 noise; Eb/N0 counts the tail, at a rate of K / (3 K + 12). The same seed gives the same
 results whatever the number of threads or the machine. docs/error_rates.md tells the rest.
 

@@ -61,8 +61,8 @@ int merge(const Options& options)
 }
 
 /// The end of the help text.
-constexpr char explanation[] = R"(
-The runs have the same seed and were made by the same version. Rows of the same parameters
+constexpr char explanation[] =
+    R"(The runs have the same seed and were made by the same version. Rows of the same parameters
 become one, if they have no frames in common: 'morvik ber --frames' divides them. One
 file alone is drawn as it is.
 

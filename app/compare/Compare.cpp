@@ -96,8 +96,8 @@ int compare(const Options& options)
     return found.first ? differencesFound : success;
 }
 
-constexpr char explanation[] = R"(
-A dump has the values of a simulation of hardware: CSV with the columns half_iteration, step,
+constexpr char explanation[] =
+    R"(A dump has the values of a simulation of hardware: CSV with the columns half_iteration, step,
 signal and value, or a VCD in whose scopes half_iteration and step say what the others belong
 to. Signals are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr and extrinsic;
 those that it lacks are not compared. MAP is a JSON object that tells other names and forms
