@@ -231,7 +231,7 @@ void addRuleOptions(CLI::App& command, BerOptions& options)
         .add_option_function<std::string>(
             "--stop-bler",
             [&options](const std::string& text) { options.stopBler = parseStopBler(text); },
-            "End a curve after the first point with a lower block error rate (0.0001; without end with --ebn0)")
+            "End a curve after the first point with a lower block error rate (0.0001; never if --ebn0 is given)")
         ->type_name("RATE");
     command
         .add_option_function<std::string>(
