@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "Text.h"
+#include "standard/BlockSizes.h"
 
 namespace morvik {
 
@@ -130,6 +131,25 @@ void SoftValueReader::appendRow(SoftBlock& block) const
     block.rsc1Sys.push_back(takeValue("rsc1_sys"));
     block.rsc1Par.push_back(takeValue("rsc1_par"));
     block.rsc2Par.push_back(takeValue("rsc2_par"));
+}
+
+SoftBlock readBlock(const std::string& file, std::uint32_t number)
+{
+    InputFile input(file);
+    SoftValueReader reader(input.stream(), input.name());
+    SoftBlock block;
+    for (std::uint32_t i = 0; i <= number; ++i) {
+        if (!reader.next(block)) {
+            throw FileError(input.name(),
+                            "has " + std::to_string(i) + (i == 1 ? " block" : " blocks") + ", there is no block " +
+                                std::to_string(number));
+        }
+    }
+    if (block.size() < tailPositions ||
+        standard::findBlockSize(static_cast<std::uint32_t>(block.size() - tailPositions)) == nullptr) {
+        reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
+    }
+    return block;
 }
 
 }  // namespace morvik

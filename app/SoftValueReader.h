@@ -3,6 +3,7 @@
 #define MORVIK_SOFTVALUEREADER_H
 
 #include <cstddef>
+#include <cstdint>
 #include <istream>
 #include <optional>
 #include <string>
@@ -49,6 +50,10 @@ private:
     std::string itsLabel;  // of the current row, which no block has yet
     std::size_t itsFirstLine = 0;
 };
+
+/// The block of this number, from 0, in a file; "-" is the standard input. Throws a FileError where there is none, or
+/// where its size is not one of the standard's.
+SoftBlock readBlock(const std::string& file, std::uint32_t number);
 
 }  // namespace morvik
 

@@ -16,7 +16,6 @@
 #include "Lists.h"
 #include "SoftValueReader.h"
 #include "simulation/Error.h"
-#include "standard/BlockSizes.h"
 #include "trace/TraceWriter.h"
 
 namespace morvik {
@@ -101,24 +100,6 @@ void checkUnits(const Options& options, const Division& division)
     }
 }
 
-SoftBlock readBlock(const Options& options)
-{
-    InputFile input(options.input);
-    SoftValueReader reader(input.stream(), input.name());
-    SoftBlock block;
-    for (std::uint32_t number = 0; number <= options.block; ++number) {
-        if (!reader.next(block)) {
-            throw FileError(input.name(),
-                            "has no block " + std::to_string(options.block) + ", the last one is block " +
-                                std::to_string(number - 1));
-        }
-    }
-    if (standard::findBlockSize(static_cast<std::uint32_t>(block.size() - tailPositions)) == nullptr) {
-        reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
-    }
-    return block;
-}
-
 vectors::FileWriter openOutput(const Options& options)
 {
     if (options.output == standardStream) {
@@ -149,7 +130,7 @@ int run(Options options)
     if (options.format == "npy" && options.output == standardStream) {
         throw simulation::Error("--format npy needs --output FILE");
     }
-    const SoftBlock block = readBlock(options);
+    const SoftBlock block = readBlock(options.input, options.block);
     if (options.format == "text") {
         trace::writeText(block, options.decoder.generics, selection, openOutput(options));
         return success;

@@ -121,7 +121,8 @@ int run(const CLI::App& command, const Options& options)
         return check(options.checked);
     }
     if (options.output.empty() || options.settings.blockSizes.empty()) {
-        throw simulation::Error("--out and --block-size, or --check, are required; 'morvik vectors --help' tells more");
+        throw simulation::Error(
+            "--out and --block-size, or --check, are required; 'morvik vectors --help' tells what is allowed");
     }
     return make(options);
 }

@@ -17,7 +17,6 @@
 #include "comparison/NameMap.h"
 #include "comparison/Report.h"
 #include "simulation/Error.h"
-#include "standard/BlockSizes.h"
 
 namespace morvik {
 
@@ -31,26 +30,6 @@ struct Options {
     std::string form;
     DecoderOptions decoder;
 };
-
-/// The block of this number in the file, from 0.
-SoftBlock readBlock(const std::string& file, std::uint32_t number)
-{
-    InputFile input(file);
-    SoftValueReader reader(input.stream(), input.name());
-    SoftBlock block;
-    for (std::uint32_t i = 0; i <= number; ++i) {
-        if (!reader.next(block)) {
-            throw FileError(input.name(),
-                            "has " + std::to_string(i) + (i == 1 ? " block" : " blocks") + ", there is no block " +
-                                std::to_string(number));
-        }
-    }
-    if (block.size() < tailPositions ||
-        standard::findBlockSize(static_cast<std::uint32_t>(block.size() - tailPositions)) == nullptr) {
-        reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
-    }
-    return block;
-}
 
 comparison::NameMap readMap(const std::string& file)
 {

@@ -186,7 +186,7 @@ std::string neighbours(std::uint32_t K)
     if (above == standard::blockSizes.begin() || above == standard::blockSizes.end()) {
         return "they go from 40 to 6144";
     }
-    return "the next ones are " + std::to_string((above - 1)->K) + " and " + std::to_string(above->K);
+    return "the nearest ones are " + std::to_string((above - 1)->K) + " and " + std::to_string(above->K);
 }
 
 std::string information(const Options& options)

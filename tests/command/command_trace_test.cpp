@@ -290,7 +290,7 @@ TEST_F(CommandTrace, TellsWhatIsWrongWithFiles)
 {
     const std::string k40 = vectors("k40.csv");
     expectRefused({"nowhere.csv"}, "nowhere.csv: cannot be opened: No such file or directory");
-    expectRefused({k40, "--block", "8"}, k40 + ": has no block 8, the last one is block 7");
+    expectRefused({k40, "--block", "8"}, k40 + ": has 8 blocks, there is no block 8");
     morvik.write("short.csv", header + '\n' + zeroRows("0", 45));
     expectRefused({"short.csv"},
                   "short.csv:2: block of 45 rows, allowed are K + 4 rows, K being one of the block sizes of 3GPP TS "

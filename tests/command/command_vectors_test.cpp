@@ -122,7 +122,8 @@ TEST_F(CommandVectors, TellsADifference)
 TEST_F(CommandVectors, RefusesWhatIsNotAllowed)
 {
     const std::string help = "; 'morvik vectors --help' tells what is allowed";
-    const std::string required = "--out and --block-size, or --check, are required; 'morvik vectors --help' tells more";
+    const std::string required =
+        "--out and --block-size, or --check, are required; 'morvik vectors --help' tells what is allowed";
     expectRefused({}, required);
     expectRefused({"--out", "set"}, required);
     expectRefused({"--block-size", "40"}, required);
