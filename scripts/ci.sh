@@ -82,7 +82,7 @@ library_of() {
 stage_memory() {
     scripts/build sanitize
     # Long simulations would take ten minutes here; the other tests of the command run the same code.
-    scripts/run-tests sanitize -E '^(BerRuns|MpiRuns)'
+    scripts/run-tests sanitize -E '^(BerRuns|MpiRuns|Diagnosis\.(FindsEachMistakeInEachSize|BlamesNoiseAlone))'
     scripts/build x86_64
     local test
     for test in exact_blocks_test random_blocks_test morvik_v1_0_bitacc_cmodel_test TDecoder3G_test TDecoder3GPU_test; do
