@@ -146,9 +146,11 @@ Results parseJson(const std::string& text, const std::string& fileName)
     return results;
 }
 
+/// File names in a command, and texts of CSV, may hold bytes that are no UTF-8, which JSON cannot: U+FFFD stands for
+/// them.
 std::string jsonString(const std::string& text)
 {
-    return nlohmann::json(text).dump();
+    return nlohmann::json(text).dump(-1, ' ', false, nlohmann::json::error_handler_t::replace);
 }
 
 std::string jsonValue(const Column& column, const ResultRow& row)
