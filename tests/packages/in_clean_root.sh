@@ -15,34 +15,34 @@ apt-get install -q -y --no-install-recommends ./*_amd64.deb ./*_all.deb ./libmor
     openmpi-bin >log 2>&1 || { cat log; fail "They cannot be installed"; }
 installed=$(dpkg-query --show --showformat '${Package}:${Architecture}\n' '*morvik*' | sort)
 echo "$installed"
-mkdir -m 777 work
+mkdir -m 777 scratch
 
 # As anybody, in a folder of their own.
 as_nobody() {
-    setpriv --reuid=65534 --regid=65534 --clear-groups env HOME="$PWD/work" "$@"
+    setpriv --reuid=65534 --regid=65534 --clear-groups env HOME="$PWD/scratch" "$@"
 }
 
 echo "== command"
 as_nobody morvik decode k40.csv --num-pu 8 --iterations 6 --reference k40.bits
 as_nobody morvik selftest | tail -n 1
-as_nobody mpirun --mca plm isolated -n 1 morvik-mpi ber --block-size 40 --ebn0 1 --max-blocks 100 --output work/k40.csv >/dev/null
-grep -c , work/k40.csv
+as_nobody mpirun --mca plm isolated -n 1 morvik-mpi ber --block-size 40 --ebn0 1 --max-blocks 100 --output scratch/k40.csv >/dev/null
+grep -c , scratch/k40.csv
 
 echo "== examples by pkg-config, of both word sizes"
 examples=/usr/share/doc/libmorvik-v1-0-bitacc-cmodel-dev/examples
 for bits in 64 32; do
-    mkdir -m 777 "work/$bits"
+    mkdir -m 777 "scratch/$bits"
     case $bits in
         64) libraries=/usr/lib/x86_64-linux-gnu ;;
         32) libraries=/usr/lib/i386-linux-gnu ;;
     esac
-    as_nobody PKG_CONFIG_LIBDIR=$libraries/pkgconfig CFLAGS=-m$bits CXXFLAGS=-m$bits OUT="$PWD/work/$bits" make -s -C "$examples" check
+    as_nobody PKG_CONFIG_LIBDIR=$libraries/pkgconfig CFLAGS=-m$bits CXXFLAGS=-m$bits OUT="$PWD/scratch/$bits" make -s -C "$examples" check
 done
 
 echo "== examples by CMake"
-as_nobody cmake -S "$examples" -B work/cmake >/dev/null
-as_nobody cmake --build work/cmake >/dev/null
-as_nobody ctest --test-dir work/cmake | tail -n 3
+as_nobody cmake -S "$examples" -B scratch/cmake >/dev/null
+as_nobody cmake --build scratch/cmake >/dev/null
+as_nobody ctest --test-dir scratch/cmake | tail -n 3
 
 echo "== Python"
 as_nobody python3 -c "
@@ -62,9 +62,9 @@ assert(isequal(morvik_decode(16 * (2 * a - 1), 16 * (2 * b - 1), 16 * (2 * c - 1
 disp(which('morvik_decode'))"
 
 echo "== Icarus Verilog"
-printf 'module test; initial $display("%%0d", $morvik_create(8, 1, 8)); endmodule\n' >work/test.v
-as_nobody iverilog -o work/test.vvp work/test.v
-as_nobody vvp -m morvik work/test.vvp
+printf 'module test; initial $display("%%0d", $morvik_create(8, 1, 8)); endmodule\n' >scratch/test.v
+as_nobody iverilog -o scratch/test.vvp scratch/test.v
+as_nobody vvp -m morvik scratch/test.vvp
 
 echo "== remove"
 # shellcheck disable=SC2086
