@@ -46,6 +46,11 @@ blocks::Block noisyBlock(unsigned K, int amplitude = 16)
     return block;
 }
 
+bool has(const std::string& text, const std::string& part)
+{
+    return text.find(part) != std::string::npos;
+}
+
 class Compare : public CommandTest {
 protected:
     void writeBlock(unsigned K, int amplitude = 16) const
@@ -61,6 +66,21 @@ protected:
                                               morvik.directory() + "/block.csv",
                                               morvik.directory() + "/rtl.csv");
         ASSERT_EQ(result.status, 0) << result.err;
+    }
+
+    /// Leaves the log-likelihood ratios alone in rtl.csv, each as `written` writes it.
+    template <class Written>
+    void keepRatios(Written written) const
+    {
+        std::string ratios = "half_iteration,step,signal,value\n";
+        std::istringstream all(morvik.read("rtl.csv"));
+        for (std::string line; std::getline(all, line);) {
+            if (has(line, ",llr,")) {
+                const std::size_t value = line.rfind(',') + 1;
+                ratios += line.substr(0, value) + written(line.substr(value)) + '\n';
+            }
+        }
+        morvik.write("rtl.csv", ratios);
     }
 
     CommandResult compare(const std::vector<std::string>& options = {}) const
@@ -96,11 +116,6 @@ protected:
 };
 
 class FaultyCore : public Compare, public testing::WithParamInterface<FaultCase> {};
-
-bool has(const std::string& text, const std::string& part)
-{
-    return text.find(part) != std::string::npos;
-}
 
 TEST_P(FaultyCore, IsFoundAtItsPlace)
 {
@@ -216,12 +231,7 @@ TEST_F(Compare, TellsWhatADumpOfRatiosAloneTells)
 {
     writeBlock(512);
     writeDump("ratio_sign", 2, 1);
-    std::string ratios = "half_iteration,step,signal,value\n";
-    std::istringstream all(morvik.read("rtl.csv"));
-    for (std::string line; std::getline(all, line);) {
-        ratios += has(line, ",llr,") ? line + '\n' : "";
-    }
-    morvik.write("rtl.csv", ratios);
+    keepRatios([](const std::string& value) { return value; });
     const CommandResult result = compare();
     EXPECT_EQ(result.status, 1);
     EXPECT_TRUE(has(result.out, "  half-iteration  0, on the")) << result.out;
@@ -234,17 +244,11 @@ TEST_F(Compare, TellsThatRealNumbersLackTheirPoints)
 {
     writeBlock(40);
     writeDump("none", 2, 1);
-    std::string ratios = "half_iteration,step,signal,value\n";
-    std::istringstream all(morvik.read("rtl.csv"));
-    for (std::string line; std::getline(all, line);) {
-        if (has(line, ",llr,")) {
-            const std::size_t value = line.rfind(',') + 1;
-            std::ostringstream real;
-            real << std::stoi(line.substr(value)) / 8.0;  // 9, not 9.0
-            ratios += line.substr(0, value) + real.str() + '\n';
-        }
-    }
-    morvik.write("rtl.csv", ratios);
+    keepRatios([](const std::string& value) {
+        std::ostringstream real;
+        real << std::stoi(value) / 8.0;  // 9, not 9.0
+        return real.str();
+    });
     EXPECT_TRUE(has(compare().out, "values are whole numbers where eighths are expected: \"numbers\": \"real\""));
     morvik.write("map.json", R"({"numbers": "real"})");
     EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
