@@ -7,18 +7,18 @@ namespace {
 
 class Comparer {
 public:
-    Comparer(const Model& model, const Values& dump) : itsModel(model), itsDump(dump), itsReplay(model, dump) {}
+    Comparer(const Model& model, const Values& dump, Unknown unknown)
+        : itsModel(model), itsDump(dump), itsReplay(model, dump)
+    {
+        itsResult.ignoresUnknown = unknown == Unknown::isIgnored;
+    }
 
     Comparison compare()
     {
         for (unsigned pass = 0; pass < itsDump.passes(); ++pass) {
-            for (const Stage stage : stages) {
-                for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
-                    compareColumn(pass, stage, step);
-                }
-            }
+            comparePass(pass);
         }
-        if (itsResult.faults.empty() && itsResult.first) {
+        if (itsResult.allFaults() == 0 && itsResult.first) {
             itsResult.inputsAreKnown = false;
             takeFirstStage();
         }
@@ -32,28 +32,34 @@ public:
     }
 
 private:
-    bool isInDump(unsigned pass, Stage stage, unsigned step) const
+    /// Whether the value takes part in the comparison.
+    bool counts(const Place& place) const
     {
-        const auto [first, count] = signalsOf(stage);
-        for (unsigned i = 0; i < count; ++i) {
-            if (itsDump.has({pass, first + i, step})) {
-                return true;
+        return itsDump.has(place) || (itsDump.isUnknown(place) && !itsResult.ignoresUnknown);
+    }
+
+    void comparePass(unsigned pass)
+    {
+        const std::uint64_t before = itsResult.compared();
+        for (const Stage stage : stages) {
+            for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
+                compareColumn(pass, stage, step);
             }
         }
-        return false;
+        itsResult.passes += itsResult.compared() > before ? 1U : 0U;
     }
 
     void compareColumn(unsigned pass, Stage stage, unsigned step)
     {
-        if (!isInDump(pass, stage, step)) {
-            return;
-        }
-        const Column follows = itsReplay.column(pass, stage, step);
         const auto [first, count] = signalsOf(stage);
+        std::optional<Column> follows;
         for (unsigned i = 0; i < count; ++i) {
             const Place place = {pass, first + i, step};
-            if (itsDump.has(place)) {
-                compareValue(place, follows.values[i], follows.complete);
+            itsResult.signals[place.signal].unknown += itsDump.isUnknown(place) ? 1U : 0U;
+            itsResult.signals[place.signal].missing += itsDump.at(place) == Values::missing ? 1U : 0U;
+            if (counts(place)) {
+                follows = follows ? follows : itsReplay.column(pass, stage, step);
+                compareValue(place, follows->values[i], follows->complete);
             }
         }
     }
@@ -73,8 +79,17 @@ private:
             }
         }
         if (complete && got != wanted) {
-            ++count.faults;
-            itsResult.faults.push_back({place, got, wanted});
+            keepFault({place, got, wanted}, count);
+        }
+    }
+
+    void keepFault(const Fault& fault, SignalCount& count)
+    {
+        ++count.faults;
+        if (itsDump.has(fault.place)) {
+            itsResult.faults.push_back(fault);
+        } else {
+            ++count.unknownFaults;
         }
     }
 
@@ -98,7 +113,7 @@ private:
         const auto [first, count] = signalsOf(input.stage);
         for (unsigned i = 0; i < count; ++i) {
             const Place place = {input.pass, first + i, input.step};
-            if (itsDump.has(place)) {
+            if (counts(place)) {
                 ++input.present;
                 input.different += itsDump.at(place) != itsModel.values.at(place) ? 1U : 0U;
             }
@@ -196,14 +211,29 @@ std::uint64_t Comparison::different() const
     return sum<&SignalCount::different>(signals);
 }
 
+std::uint64_t Comparison::unknown() const
+{
+    return sum<&SignalCount::unknown>(signals);
+}
+
+std::uint64_t Comparison::knownCompared() const
+{
+    return compared() - (ignoresUnknown ? 0 : unknown());
+}
+
+std::uint64_t Comparison::knownDifferent() const
+{
+    return different() - (ignoresUnknown ? 0 : unknown());
+}
+
 std::uint64_t Comparison::allFaults() const
 {
     return sum<&SignalCount::faults>(signals);
 }
 
-Comparison compare(const Model& model, const Values& dump)
+Comparison compare(const Model& model, const Values& dump, Unknown unknown)
 {
-    return Comparer(model, dump).compare();
+    return Comparer(model, dump, unknown).compare();
 }
 
 }  // namespace morvik::comparison

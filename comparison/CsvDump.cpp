@@ -41,12 +41,14 @@ std::optional<std::size_t> findColumn(std::string_view header, std::string_view 
     return std::nullopt;
 }
 
-/// Whether a simulator writes a value of unknown bits so: as x, or with digits of x or z, "xxx", "0x7x", "zz01".
+/// Whether a simulator writes a value of unknown bits so: as x, or with digits of x, z, u or w, "xxx", "0x7x", "zz01",
+/// "UUUU"; VHDL has - as well.
 bool isUnknown(std::string_view text, NumberForm form)
 {
     text.remove_prefix(text.substr(0, 2) == "0x" && form != NumberForm::binary ? 2 : 0);
-    return text.find_first_of("xXzZ") != std::string_view::npos &&
-           text.find_first_not_of("xXzZ0123456789abcdefABCDEF") == std::string_view::npos;
+    const bool any = text.find_first_of("xXzZuUwW") != std::string_view::npos ||
+                     text.find_first_not_of('-') == std::string_view::npos;
+    return any && !text.empty() && text.find_first_not_of("xXzZuUwW-0123456789abcdefABCDEF") == std::string_view::npos;
 }
 
 /// Reads rows of a value each, which name the signal, or rows with a column for each signal.
@@ -100,6 +102,7 @@ private:
             const auto signal = itsMap.signal(name);
             if (signal && *signal != NameMap::leftOut) {
                 itsColumns.push_back({name, *signal, i});
+                itsDump.given[*signal] = true;
             }
         }
         if (itsColumns.empty()) {
@@ -139,18 +142,27 @@ private:
         }
     }
 
+    /// A row of unknown values may be one of before the simulation counts.
+    bool namesItsPlace(std::string_view row) const
+    {
+        return !isUnknown(field(row, itsPass), NumberForm::integer) &&
+               !isUnknown(field(row, itsStep), NumberForm::integer);
+    }
+
     void take(std::string_view name, unsigned signal, std::string_view text)
     {
-        if (text.empty() || isUnknown(text, itsMap.numbers)) {
+        itsDump.given[signal] = true;
+        const std::string_view row = itsFile.line();
+        const bool unknown = isUnknown(text, itsMap.numbers);
+        if (text.empty() || (unknown && !namesItsPlace(row))) {
             return;
         }
-        const std::string_view row = itsFile.line();
         const Place place = {
             itsFile.count("half-iteration", field(row, itsPass), itsMap.firstPass, itsDump.values.passes()),
             signal,
             itsFile.count("step", field(row, itsStep), itsMap.firstStep, itsDump.values.steps())};
-        const std::int16_t value = itsFile.value(name, signal, text, itsMap);
-        if (itsDump.values.has(place)) {
+        const std::int16_t value = unknown ? Values::unknown : itsFile.value(name, signal, text, itsMap);
+        if (itsDump.values.at(place) != Values::missing) {
             itsFile.fail(std::string(name) + " of this half-iteration and step stands in line " +
                          std::to_string(itsDump.lineOf(place)) + ", too");
         }

@@ -2,6 +2,7 @@
 #ifndef MORVIK_COMPARISON_DUMP_H
 #define MORVIK_COMPARISON_DUMP_H
 
+#include <array>
 #include <cstdint>
 #include <istream>
 #include <map>
@@ -32,17 +33,19 @@ struct Dump {
 
     Values values;
     std::vector<std::uint32_t> lines;
+    std::array<bool, signalCount> given = {};  ///< signals that have a column, a row or a variable
 };
 
 /// Reads CSV: a header with the columns half_iteration, step, signal and value in any order, or, for the last two, a
-/// column for each signal; the map may call them otherwise, and other columns are left alone. An empty value, or one
-/// with digits of x or z, is not known and does not count. What is wrong is thrown as a simulation::Error that opens
-/// with the place.
+/// column for each signal; the map may call them otherwise, and other columns are left alone. A value with digits of x,
+/// z, u or w is unknown; an empty one is none. What is wrong is thrown as a simulation::Error that opens with the
+/// place.
 void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
 /// Reads a value change dump. In each scope with signals, half_iteration and step (in the scope or one around it) tell
-/// what the signals' values belong to, at the end of each time at which the scope has changed; what is not known (x or
-/// z) does not count. What is wrong is thrown as a simulation::Error that opens with the place.
+/// what the signals' values belong to, at the end of each time at which the scope has changed. A value is unknown where
+/// it is so at all times at which half_iteration and step name it: x before, between and behind these times means
+/// nothing. What is wrong is thrown as a simulation::Error that opens with the place.
 void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
 }  // namespace morvik::comparison

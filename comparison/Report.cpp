@@ -68,22 +68,19 @@ std::string shortName(Stage stage)
 
 class Reporter {
 public:
-    Reporter(const Comparison& comparison,
-             const Model& model,
-             const Dump& dump,
-             const std::string& name,
-             const std::optional<std::string>& otherRun)
-        : itsComparison(comparison), itsModel(model), itsDump(dump), itsName(name), itsOtherRun(otherRun)
+    explicit Reporter(const Compared& compared)
+        : itsCompared(compared), itsComparison(compared.comparison), itsModel(compared.model), itsDump(compared.dump)
     {
     }
 
     std::string text()
     {
-        itsText = itsName + ": " + counted(itsComparison.compared(), "value") + " compared, ";
+        addVerdictOnAll();
+        addCoverage();
         if (!itsComparison.first) {
-            return itsText + "all as the model computes them\n";
+            return itsText;
         }
-        itsText += counted(itsComparison.different(), "difference") + "\n\n";
+        itsText += '\n';
         addPlace(*itsComparison.first);
         addValue(*itsComparison.first);
         addContext(*itsComparison.first);
@@ -94,10 +91,45 @@ public:
     }
 
 private:
+    void addVerdictOnAll()
+    {
+        const Comparison& all = itsComparison;
+        itsText =
+            itsCompared.name + format(": compared %u of %u half-iterations, ", all.passes, itsDump.values.passes());
+        itsText += std::to_string(all.compared()) + " of " + counted(itsCompared.coverage.computed, "value") + ": ";
+        itsText += all.first ? counted(all.different(), "difference") : "all as the model computes them";
+        if (all.unknown() > 0 && !all.ignoresUnknown) {
+            itsText += all.knownDifferent() == 0 ? ", all of them" : ", " + std::to_string(all.unknown()) + " of them";
+            itsText += " unknown values (x)";
+        }
+        itsText += '\n';
+    }
+
+    void addCoverage()
+    {
+        const Coverage& coverage = itsCompared.coverage;
+        if (itsComparison.ignoresUnknown && itsComparison.unknown() > 0) {
+            itsText += "  ignored: " + counted(itsComparison.unknown(), "unknown value") + " (x)\n";
+        }
+        for (const std::string& each : lacksOf(coverage)) {
+            itsText += "  not in the dump: " + each + '\n';
+        }
+        if (coverage.isComplete() || itsCompared.isPartial) {
+            return;
+        }
+        itsText +=
+            "Not complete: a dump should have all values of its signals. --partial accepts one that is meant to "
+            "hold fewer";
+        if (coverage.iterations) {
+            itsText += format("; for a simulation of fewer iterations, give --iterations %u", *coverage.iterations);
+        }
+        itsText += ".\n";
+    }
+
     void addPlace(const Place& place)
     {
         const Windows& windows = itsModel.windows;
-        itsText += "First difference, in the order of computation (" + itsName + ':' +
+        itsText += "First difference, in the order of computation (" + itsCompared.name + ':' +
                    std::to_string(itsDump.lineOf(place)) + "):\n";
         itsText += format("  half-iteration  %u, on the %s code\n", place.pass, codeName(place.pass));
         const StepPlace where = itsModel.division.placeOf(place.step);
@@ -133,7 +165,9 @@ private:
     {
         itsText += "                decimal        real         hex\n";
         itsText += valueLine("expected", itsModel.values.at(place));
-        itsText += valueLine("got", itsDump.values.at(place)) + '\n';
+        itsText += itsDump.values.has(place) ? valueLine("got", itsDump.values.at(place))
+                                             : format("  %-12s%9s%12s%12s\n", "got", "x", "x", "x");
+        itsText += '\n';
     }
 
     void addContext(const Place& place)
@@ -146,17 +180,23 @@ private:
             if (!itsModel.values.has(each)) {
                 continue;
             }
-            const bool has = itsDump.values.has(each);
-            const std::string got = has ? std::to_string(itsDump.values.at(each)) : "-";
-            const bool differs = has && itsDump.values.at(each) != itsModel.values.at(each);
+            const bool isThere = itsDump.values.at(each) != Values::missing;
+            const bool differs = isThere && itsDump.values.at(each) != itsModel.values.at(each);
             itsText += format("%s %9u%12d%12s%s\n",
                               step == place.step ? ">" : " ",
                               step,
                               itsModel.values.at(each),
-                              got.c_str(),
+                              gotText(each).c_str(),
                               differs ? " *" : "");
         }
         itsText += '\n';
+    }
+
+    std::string gotText(const Place& place) const
+    {
+        return itsDump.values.has(place)         ? std::to_string(itsDump.values.at(place))
+               : itsDump.values.isUnknown(place) ? "x"
+                                                 : "-";
     }
 
     void addInputs(const Place& place)
@@ -217,16 +257,24 @@ private:
 
     void addCounts()
     {
-        itsText +=
-            format("%-10s%10s%12s%10s   %s\n", "signal", "compared", "differences", "faults", "first difference");
+        itsText += format("%-10s%10s%9s%9s%13s%9s   %s\n",
+                          "signal",
+                          "compared",
+                          "missing",
+                          "unknown",
+                          "differences",
+                          "faults",
+                          "first difference");
         for (unsigned i = 0; i < signalCount; ++i) {
             const SignalCount& count = itsComparison.signals[i];
-            if (count.compared == 0) {
+            if (count.compared + count.unknown == 0) {
                 continue;
             }
-            itsText += format("%-10s%10llu%12llu%10llu",
+            itsText += format("%-10s%10llu%9llu%9llu%13llu%9llu",
                               passSignals[i],
                               static_cast<unsigned long long>(count.compared),
+                              static_cast<unsigned long long>(count.missing),
+                              static_cast<unsigned long long>(count.unknown),
                               static_cast<unsigned long long>(count.different),
                               static_cast<unsigned long long>(count.faults));
             itsText +=
@@ -239,16 +287,44 @@ private:
                   "looked at.\n\n";
     }
 
+    template <std::uint64_t SignalCount::*member>
+    std::uint64_t sum(Stage stage) const
+    {
+        std::uint64_t count = 0;
+        for (unsigned i = 0; i < signalsOf(stage).count; ++i) {
+            count += itsComparison.signals[signalsOf(stage).first + i].*member;
+        }
+        return count;
+    }
+
+    void addUnknown()
+    {
+        const auto add = [this](Stage stage, const std::string& count, const char* what) {
+            itsText += "Found in " + std::string(wordsOf(stage).values) + ", " + count + ":\n  " + what;
+        };
+        const Stage first = stageOf(itsComparison.first->signal);
+        for (const Stage stage : stages) {
+            const std::uint64_t faults = sum<&SignalCount::unknownFaults>(stage);
+            const std::uint64_t unknown = itsComparison.ignoresUnknown ? 0 : sum<&SignalCount::unknown>(stage);
+            if (faults > 0) {
+                add(stage, counted(faults, "fault"), "unknown (x), though all inputs are known.\n");
+            } else if (!itsComparison.inputsAreKnown && stage == first && unknown > 0) {
+                add(stage, counted(unknown, "difference"), "unknown (x).\n");
+            }
+        }
+    }
+
     void addFindings()
     {
-        if (itsOtherRun) {
-            itsText += "Found: the dump is what the model computes " + *itsOtherRun + ".\n";
+        addUnknown();
+        if (itsCompared.otherRun) {
+            itsText += "Found: the dump is what the model computes " + *itsCompared.otherRun + ".\n";
         } else if (const auto shift = findShift(itsModel, itsDump.values)) {
             itsText += "Found: " + *shift + ".\n";
             return;
         }
         for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison)) {
-            if (itsOtherRun && finding.how.empty()) {
+            if (itsCompared.otherRun && finding.how.empty()) {
                 continue;  // it is explained
             }
             const std::string values = wordsOf(finding.stage).values;
@@ -268,23 +344,18 @@ private:
         }
     }
 
+    const Compared& itsCompared;
     const Comparison& itsComparison;
     const Model& itsModel;
     const Dump& itsDump;
-    const std::string& itsName;
-    const std::optional<std::string>& itsOtherRun;
     std::string itsText;
 };
 
 }  // namespace
 
-std::string textOf(const Comparison& comparison,
-                   const Model& model,
-                   const Dump& dump,
-                   const std::string& name,
-                   const std::optional<std::string>& otherRun)
+std::string textOf(const Compared& compared)
 {
-    return Reporter(comparison, model, dump, name, otherRun).text();
+    return Reporter(compared).text();
 }
 
 }  // namespace morvik::comparison

@@ -6,18 +6,25 @@
 #include <string>
 
 #include "Comparison.h"
+#include "Coverage.h"
 #include "Dump.h"
 #include "Model.h"
 
 namespace morvik::comparison {
 
-/// What is printed; `name` is what messages call the dump, `otherRun` how the model computes the dump as it is, if it
-/// does.
-std::string textOf(const Comparison& comparison,
-                   const Model& model,
-                   const Dump& dump,
-                   const std::string& name,
-                   const std::optional<std::string>& otherRun);
+/// What a report is about. What it refers to outlives it.
+struct Compared {
+    const Comparison& comparison;
+    const Coverage& coverage;
+    const Model& model;
+    const Dump& dump;
+    std::string name;                     ///< what messages call the dump
+    bool isPartial;                       ///< the dump may lack values
+    std::optional<std::string> otherRun;  ///< how the model computes the dump as it is, if it does
+};
+
+/// What is printed.
+std::string textOf(const Compared& compared);
 
 }  // namespace morvik::comparison
 

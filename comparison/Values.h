@@ -55,6 +55,7 @@ public:
     static constexpr std::int16_t smallest = -2048;
     static constexpr std::int16_t largest = 2047;
     static constexpr std::int16_t missing = INT16_MIN;
+    static constexpr std::int16_t unknown = INT16_MIN + 1;  ///< x where there should be a value
 
     Values(unsigned passes, unsigned steps)
         : itsPasses(passes), itsSteps(steps), itsValues(std::size_t{passes} * signalCount * steps, missing)
@@ -81,9 +82,15 @@ public:
         return itsValues[index(place)];
     }
 
+    /// Whether there is a value, and it is known.
     bool has(const Place& place) const
     {
-        return at(place) != missing;
+        return at(place) >= smallest;
+    }
+
+    bool isUnknown(const Place& place) const
+    {
+        return at(place) == unknown;
     }
 
     void set(const Place& place, std::int16_t value)

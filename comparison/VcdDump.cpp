@@ -32,7 +32,7 @@ enum class Digit : std::uint8_t { zero, one, unknown, none };
 
 Digit digitOf(char character)
 {
-    constexpr std::string_view ofAKind[] = {"0L", "1H", "xXzZUW-"};
+    constexpr std::string_view ofAKind[] = {"0L", "1H", "xXzZuUwW-"};
     std::uint8_t kind = 0;
     while (kind < std::size(ofAKind) && ofAKind[kind].find(character) == std::string_view::npos) {
         ++kind;
@@ -246,6 +246,7 @@ private:
         } else if (signal && *signal != NameMap::leftOut) {
             variable.signal = *signal;
             scope.signals.push_back(number);
+            itsDump.given[*signal] = true;
             itsAnySignal = true;
         } else {
             return false;
@@ -374,6 +375,11 @@ private:
             itsFile.count("step", std::to_string(*step->value), itsMap.firstStep, itsDump.values.steps());
         for (const unsigned number : itsScopes[scope].signals) {
             const Variable& variable = itsVariables[number];
+            const Place place = {h, variable.signal, n};
+            if (!variable.value && !itsDump.values.has(place)) {
+                itsDump.values.set(place, Values::unknown);
+                itsDump.lineOf(place) = itsFile.number();
+            }
             if (!variable.value) {
                 continue;
             }
@@ -381,8 +387,8 @@ private:
                 itsFile.fail(variable.name + ' ' + std::to_string(*variable.value) +
                              " is not allowed, expected -2048 to 2047 eighths");
             }
-            itsDump.values.set({h, variable.signal, n}, static_cast<std::int16_t>(*variable.value));
-            itsDump.lineOf({h, variable.signal, n}) = variable.line;
+            itsDump.values.set(place, static_cast<std::int16_t>(*variable.value));
+            itsDump.lineOf(place) = variable.line;
         }
     }
 

@@ -12,6 +12,7 @@
 #include "OtherRuns.h"
 #include "SoftValueReader.h"
 #include "comparison/Comparison.h"
+#include "comparison/Coverage.h"
 #include "comparison/Dump.h"
 #include "comparison/Model.h"
 #include "comparison/NameMap.h"
@@ -28,6 +29,8 @@ struct Options {
     std::string dump;
     std::string map;
     std::string form;
+    bool ignoreUnknown = false;
+    bool partial = false;
     DecoderOptions decoder;
 };
 
@@ -60,29 +63,37 @@ int compare(const Options& options)
     comparison::Dump dump(model.values.passes(), model.values.steps());
     InputFile input(options.dump);
     (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);
-    const comparison::Comparison found = comparison::compare(model, dump.values);
+    using comparison::Unknown;
+    const comparison::Comparison found =
+        comparison::compare(model, dump.values, options.ignoreUnknown ? Unknown::isIgnored : Unknown::differs);
     if (found.compared() == 0) {
-        throw FileError(input.name(), "holds no value that the core computes");
+        throw FileError(input.name(),
+                        found.unknown() > 0 ? "holds no known value" : "holds no value that the core computes");
     }
+    const comparison::Coverage coverage = comparison::coverageOf(model, dump);
     // Few values may agree with another run by chance.
     constexpr std::uint64_t telling = 64;
-    const auto otherRun =
-        found.first && found.compared() >= telling ? findOtherRun(run, dump.values) : std::optional<std::string>();
-    std::cout << comparison::textOf(found, model, dump, input.name(), otherRun) << std::flush;
+    const auto otherRun = found.knownDifferent() > 0 && found.knownCompared() >= telling
+                              ? findOtherRun(run, dump.values)
+                              : std::optional<std::string>();
+    std::cout << comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRun})
+              << std::flush;
     if (!std::cout) {
         throw FileError("<stdout>", cannotBe("written"));
     }
-    return found.first ? differencesFound : success;
+    return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
 }
 
 constexpr char explanation[] =
     R"(A dump has the values of a simulation of hardware: CSV with the columns half_iteration, step,
 signal and value, or a VCD in whose scopes half_iteration and step say what the others belong
-to. Signals are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr and extrinsic;
-those that it lacks are not compared. MAP is a JSON object that tells other names and forms
-of numbers; docs/compare.md has examples.
+to. Signals are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr and extrinsic.
+It may lack signals, but not values of those that it has, unless --partial is given; a value
+that is x differs, unless --ignore-x is given. MAP is a JSON object that tells other names
+and forms of numbers; docs/compare.md has examples.
 
-Exit status: 0 all values agree, 1 a difference was found, 2 bad input or usage.
+Exit status: 0 all values agree, 1 a difference was found or values are missing, 2 bad input
+or usage.
 
 Example:
   morvik compare --block k40.csv --num-pu 8 --dump rtl.csv --map names.json)";
@@ -108,6 +119,8 @@ Command addCompare(CLI::App& app)
     command->add_option("--format", options->form, "csv or vcd; otherwise as the name of the dump ends")
         ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
         ->type_name("FORMAT");
+    command->add_flag("--ignore-x", options->ignoreUnknown, "Leave out unknown values, and count them");
+    command->add_flag("--partial", options->partial, "Accept a dump that lacks values of its signals, and count them");
     addDecoderOptions(*command, options->decoder);
     command->footer(explanation);
 

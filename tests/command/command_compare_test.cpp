@@ -181,6 +181,9 @@ INSTANTIATE_TEST_SUITE_P(
         FaultCase{"forward_state_swapped", 512, 2, 1, 0, forward, "no pattern that is known"}),
     [](const testing::TestParamInfo<FaultCase>& each) { return std::string(each.param.fault); });
 
+const std::string allOf1088 =
+    "compared 8 of 8 half-iterations, 200280 of 200280 values: all as the model computes them\n";
+
 TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
 {
     for (const int algorithm : {0, 1, 2}) {
@@ -188,7 +191,7 @@ TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
         writeDump("none", 4, algorithm);
         const CommandResult result = compare({"--num-pu", "4", "--algorithm", std::to_string(algorithm)});
         EXPECT_EQ(result.status, 0) << result.out;
-        EXPECT_EQ(result.out, "rtl.csv: 200280 values compared, all as the model computes them\n");
+        EXPECT_EQ(result.out, "rtl.csv: " + allOf1088);
         EXPECT_EQ(result.err, "");
     }
 }
@@ -204,7 +207,7 @@ TEST_F(Compare, AgreesWithTheTraceOfTheModel)
         const CommandResult result =
             morvik.run({"compare", "--block", "block.csv", "--iterations", "4", "--dump", file});
         EXPECT_EQ(result.status, 0) << result.out;
-        EXPECT_EQ(result.out, file + ": 200280 values compared, all as the model computes them\n");
+        EXPECT_EQ(result.out, file + ": " + allOf1088);
     }
 }
 
@@ -264,19 +267,20 @@ TEST_F(Compare, TellsThatADumpCountsInAnotherWay)
     EXPECT_EQ(result.status, 1);
     EXPECT_TRUE(has(result.out, "Found: the dump is a pass late, or counts half-iterations from 1;")) << result.out;
     morvik.write("map.json", R"({"first_half_iteration": 1})");
-    EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
+    EXPECT_EQ(compare({"--map", "map.json"}).status, 1) << "half-iteration 7 is missing";
+    EXPECT_EQ(compare({"--map", "map.json", "--partial"}).status, 0);
 
     writeLater(dump, 1, 1);
     EXPECT_TRUE(has(compare().out, "Found: the dump counts half-iterations and steps from 1;"));
     morvik.write("map.json", R"({"first_half_iteration": 1, "first_step": 1})");
-    EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
+    EXPECT_EQ(compare({"--map", "map.json", "--partial"}).status, 0);
 }
 
 TEST_F(Compare, PassesOnTheWarningsOfTheModel)
 {
     morvik.write("block.csv", header + "\n0,200,0,0\n" + zeroRows("0", 43));
     morvik.write("rtl.csv", "half_iteration,step,signal,value\n0,0,intrinsic,63\n");
-    const CommandResult result = compare();
+    const CommandResult result = compare({"--partial"});
     EXPECT_EQ(result.status, 0) << result.out;
     EXPECT_TRUE(has(result.err, "WARNING:")) << result.err;
 }
@@ -347,6 +351,120 @@ TEST_F(Compare, TakesFewValuesForNoOtherRun)
     }
     morvik.write("rtl.csv", all.substr(0, end));
     EXPECT_FALSE(has(compare().out, "the dump is what the model computes"));
+}
+
+TEST_F(Compare, TakesUnknownValuesForDifferences)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    keepRatios([](const std::string&) { return "x"; });
+    const CommandResult ratios = compare();
+    EXPECT_EQ(ratios.status, 1);
+    EXPECT_EQ(
+        ratios.out.substr(0, ratios.out.find('\n')),
+        "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: 320 differences, all of them unknown values "
+        "(x)");
+    EXPECT_TRUE(has(ratios.out, "\n  got                 x           x           x\n")) << ratios.out;
+    EXPECT_TRUE(has(ratios.out, "\n>         0         202           x *\n")) << ratios.out;
+    EXPECT_TRUE(has(ratios.out, "\nllr              320        0      320          320        0   half-iteration 0"))
+        << ratios.out;
+    EXPECT_TRUE(has(ratios.out, "Found in log-likelihood ratios, 320 differences:\n  unknown (x).\n")) << ratios.out;
+    expectRefused(compare({"--ignore-x"}), "rtl.csv: holds no known value");
+}
+
+TEST_F(Compare, TellsUnknownValuesFromWrongOnes)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    std::string dump = morvik.read("rtl.csv");
+    const auto replace = [&dump](const std::string& row, const std::string& value) {
+        const std::size_t start = dump.find('\n' + row) + 1 + row.size();
+        dump.replace(start, dump.find('\n', start) - start, value);
+    };
+    replace("0,7,llr,", "xxx");
+    replace("0,7,extrinsic,", "U");
+    morvik.write("rtl.csv", dump);
+    const CommandResult unknown = compare();
+    EXPECT_EQ(unknown.status, 1);
+    EXPECT_TRUE(has(unknown.out, "7448 of 7448 values: 2 differences, all of them unknown values (x)\n"))
+        << unknown.out;
+    EXPECT_TRUE(has(unknown.out, "At fault: the log-likelihood ratio (rule 8).")) << unknown.out;
+    EXPECT_TRUE(has(unknown.out, "Found in log-likelihood ratios, 1 fault:\n  unknown (x), though")) << unknown.out;
+    const CommandResult ignored = compare({"--ignore-x"});
+    EXPECT_EQ(ignored.status, 0);
+    EXPECT_EQ(ignored.out,
+              "rtl.csv: compared 8 of 8 half-iterations, 7446 of 7448 values: all as the model computes them\n"
+              "  ignored: 2 unknown values (x)\n");
+
+    replace("7,3,beta2,", "999");
+    morvik.write("rtl.csv", dump);
+    EXPECT_TRUE(has(compare().out, ": 3 differences, 2 of them unknown values (x)\n"));
+    EXPECT_TRUE(
+        has(compare({"--ignore-x"}).out, "7446 of 7448 values: 1 difference\n  ignored: 2 unknown values (x)\n"));
+}
+
+TEST_F(Compare, MissesWhatADumpLacks)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    std::istringstream all(morvik.read("rtl.csv"));
+    std::string gap;
+    std::string start;
+    unsigned lines = 0;
+    for (std::string line; std::getline(all, line);) {
+        gap += has(line, "3,8,llr,") || has(line, ",9,beta2,") ? "" : line + '\n';
+        start += ++lines <= 50 ? line + '\n' : "";
+    }
+    const std::string gaps =
+        "rtl.csv: compared 8 of 8 half-iterations, 7439 of 7448 values: all as the model computes them\n"
+        "  not in the dump: 9 values of beta2, llr; the first is beta2 of half-iteration 0, step 9\n";
+    const std::string demand =
+        "Not complete: a dump should have all values of its signals. --partial accepts one that is meant to hold fewer";
+    morvik.write("rtl.csv", gap);
+    EXPECT_EQ(compare().status, 1);
+    EXPECT_EQ(compare().out, gaps + demand + ".\n");
+    EXPECT_EQ(compare({"--partial"}).status, 0);
+    EXPECT_EQ(compare({"--partial"}).out, gaps);
+
+    morvik.write("rtl.csv", start);
+    const CommandResult cut = compare();
+    EXPECT_EQ(cut.status, 1);
+    EXPECT_TRUE(has(cut.out, "compared 1 of 8 half-iterations, 49 of 7448 values: all as")) << cut.out;
+    EXPECT_TRUE(has(cut.out, "\n  not in the dump: half-iterations 1 to 7\n")) << cut.out;
+}
+
+TEST_F(Compare, NeedsNoSignalAsAWhole)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    keepRatios([](const std::string& value) { return value; });
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.out,
+              "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: all as the model computes them\n"
+              "  not in the dump: signals intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, extrinsic\n");
+    morvik.write("rtl.csv", "half_iteration,step,llr,g0\n0,0,,\n");
+    expectRefused(compare(), "rtl.csv: holds no value that the core computes");
+}
+
+TEST_F(Compare, TellsWhatToDoWithATraceOfSomeHalfIterations)
+{
+    writeBlock(40);
+    for (const std::string format : {"csv", "vcd"}) {
+        const std::string file = "trace." + format;
+        morvik.run({"trace", "block.csv", "--half-iterations", "0:1", "--format", format, "--output", file});
+        const std::vector<std::string> arguments = {"compare", "--block", "block.csv", "--dump", file, "--iterations"};
+        const auto with = [&](const std::vector<std::string>& more) {
+            auto all = arguments;
+            all.insert(all.end(), more.begin(), more.end());
+            return morvik.run(all);
+        };
+        const CommandResult result = with({"4"});
+        EXPECT_EQ(result.status, 1);
+        EXPECT_TRUE(has(result.out, "; for a simulation of fewer iterations, give --iterations 1.\n")) << result.out;
+        EXPECT_EQ(with({"1"}).status, 0);
+        EXPECT_EQ(with({"4", "--partial"}).status, 0);
+    }
 }
 
 TEST_F(Compare, NamesBadFiles)

@@ -74,8 +74,8 @@ TEST(CsvDump, ReadsAColumnForEachSignal)
 {
     const Dump dump = read(readCsv, "block,half_iteration,step,unit,alpha3,llr\n0,1,7,0,-5,x\n0,0,0,0,,6\n");
     EXPECT_EQ(dump.values.at({1, alpha3, 7}), -5);
-    EXPECT_FALSE(dump.values.has({1, llr, 7}));
-    EXPECT_FALSE(dump.values.has({0, alpha3, 0}));
+    EXPECT_TRUE(dump.values.isUnknown({1, llr, 7}));
+    EXPECT_EQ(dump.values.at({0, alpha3, 0}), Values::missing);
     EXPECT_EQ(dump.values.at({0, llr, 0}), 6);
 }
 
@@ -100,15 +100,26 @@ TEST(CsvDump, ReadsEachFormOfNumbers)
     EXPECT_EQ(value(R"("numbers": "hex", "bits": {"extrinsic": 8})", "0f7"), 247);
 }
 
-TEST(CsvDump, LeavesOutWhatIsUnknown)
+TEST(CsvDump, TellsUnknownValuesFromMissingOnes)
 {
-    for (const char* const text : {"", " ", "x", "X", "xxx", "zzzzzzzz", "0xxxx", "0x7x", "0Z1", "fX"}) {
+    for (const char* const text :
+         {"x", "X", "xxx", "zzzzzzzz", "0xxxx", "0x7x", "0Z1", "fX", "U", "uuuu", "W1", "--"}) {
         const Dump dump = read(readCsv, header + "0,0,llr," + text + "\n0,0,alpha3,1\n");
+        EXPECT_TRUE(dump.values.isUnknown({0, llr, 0})) << text;
         EXPECT_FALSE(dump.values.has({0, llr, 0})) << text;
+        EXPECT_EQ(dump.lineOf({0, llr, 0}), 2U);
         EXPECT_TRUE(dump.values.has({0, alpha3, 0})) << text;
     }
-    const Dump dump = read(readCsv, header + "0,0,llr,0x0000000000\n", mapOf(R"({"numbers": "binary"})"));
-    EXPECT_FALSE(dump.values.has({0, llr, 0}));
+    const Dump binary = read(readCsv, header + "0,0,llr,0x0000000000\n", mapOf(R"({"numbers": "binary"})"));
+    EXPECT_TRUE(binary.values.isUnknown({0, llr, 0}));
+    for (const char* const text : {"", " "}) {
+        const Dump dump = read(readCsv, header + "0,0,llr," + text + "\n");
+        EXPECT_EQ(dump.values.at({0, llr, 0}), Values::missing);
+        EXPECT_TRUE(dump.given[llr]);
+        EXPECT_FALSE(dump.given[alpha3]);
+    }
+    const Dump before = read(readCsv, header + "x,x,llr,x\nX,0,llr,x\n0,0,llr,1\n");
+    EXPECT_EQ(before.values.at({0, llr, 0}), 1);
 }
 
 TEST(CsvDump, TakesTheNamesOfAMap)
@@ -149,6 +160,9 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
     expectRefused(readCsv, header + "0,0,llr,0x\n", R"(dump:2: llr "0x")" + numbers);
     expectRefused(readCsv,
                   header + "0,0,llr,1\n0,0,llr,1\n",
+                  "dump:3: llr of this half-iteration and step stands in line 2, too");
+    expectRefused(readCsv,
+                  header + "0,0,llr,x\n0,0,llr,1\n",
                   "dump:3: llr of this half-iteration and step stands in line 2, too");
     expectRefused(readCsv,
                   header + "0,0,llr,1000\n",
@@ -259,9 +273,64 @@ TEST(VcdDump, ReadsTheNineStatesOfVhdl)
                            "$var reg 12 a alpha3[11:0] $end\n$upscope $end\n$enddefinitions $end\n"
                            "#0\nUc\nb0 h\nbUUUUUUUUUUUUU s\nbZWX-UUUUUUUU l\nb0 a\n"
                            "#1\nHc\nb1 s\n#2\n-c\nb10 s\nbHHHHHHHHHHHL l\n");
-    EXPECT_FALSE(dump.values.has({0, llr, 1}));
+    EXPECT_TRUE(dump.values.isUnknown({0, llr, 1}));
+    EXPECT_EQ(dump.lineOf({0, llr, 1}), 18U);
     EXPECT_EQ(dump.values.at({0, alpha3, 1}), 0);
     EXPECT_EQ(dump.values.at({0, llr, 2}), -2);
+}
+
+/// A ratio that is x but for two steps; in the second, without v.
+const std::string pipeline = R"($scope module core $end
+$var integer 32 h half_iteration $end
+$var wire 13 s step $end
+$var wire 1 v ok $end
+$var wire 12 l llr $end
+$var wire 12 a alpha3 $end
+$upscope $end
+$enddefinitions $end
+#0
+0v
+#1
+b0 h
+b0 s
+#2
+b101 l
+1v
+#3
+bx l
+0v
+#4
+b1 s
+#5
+b110 l
+#6
+bx l
+b10 s
+1v
+#7
+0v
+bx s
+)";
+
+TEST(VcdDump, TakesForUnknownWhatIsSoInAllOfARow)
+{
+    const Dump dump = read(readVcd, pipeline);
+    EXPECT_EQ(dump.values.at({0, llr, 0}), 5);
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 6);
+    EXPECT_TRUE(dump.values.isUnknown({0, llr, 2}));
+    EXPECT_EQ(dump.lineOf({0, llr, 2}), 28U);
+    EXPECT_EQ(dump.values.at({0, llr, 3}), Values::missing);
+    EXPECT_TRUE(dump.values.isUnknown({0, alpha3, 0}));
+    EXPECT_TRUE(dump.given[alpha3]);
+    EXPECT_FALSE(dump.given[0]);
+}
+
+TEST(VcdDump, LeavesOutWhatIsUnknownOutsideOfValid)
+{
+    const Dump dump = read(readVcd, pipeline, mapOf(R"({"valid": "ok"})"));
+    EXPECT_EQ(dump.values.at({0, llr, 0}), 5);
+    EXPECT_EQ(dump.values.at({0, llr, 1}), Values::missing);
+    EXPECT_TRUE(dump.values.isUnknown({0, llr, 2}));
 }
 
 TEST(VcdDump, TellsElementsAndScopesApart)

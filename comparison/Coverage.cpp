@@ -1,0 +1,142 @@
+// Coverage: how much a dump has of what the core computes.
+#include "Coverage.h"
+
+#include <algorithm>
+
+namespace morvik::comparison {
+
+namespace {
+
+bool isInDump(const Values& dump, const Place& place)
+{
+    return dump.at(place) != Values::missing;
+}
+
+bool hasPass(const Values& dump, unsigned pass)
+{
+    for (unsigned signal = 0; signal < signalCount; ++signal) {
+        for (unsigned step = 0; step < dump.steps(); ++step) {
+            if (isInDump(dump, {pass, signal, step})) {
+                return true;
+            }
+        }
+    }
+    return false;
+}
+
+void countGaps(const Model& model, const Values& dump, unsigned pass, unsigned signal, Coverage& coverage)
+{
+    const std::uint64_t before = coverage.gaps;
+    for (unsigned step = 0; step < dump.steps(); ++step) {
+        const Place place = {pass, signal, step};
+        if (model.values.has(place) && !isInDump(dump, place)) {
+            ++coverage.gaps;
+            coverage.firstGap = coverage.firstGap ? coverage.firstGap : place;
+        }
+    }
+    auto& signals = coverage.gapSignals;
+    if (coverage.gaps > before && std::find(signals.begin(), signals.end(), signal) == signals.end()) {
+        signals.push_back(signal);
+    }
+}
+
+std::uint64_t countOf(const Values& values)
+{
+    std::uint64_t count = 0;
+    for (unsigned pass = 0; pass < values.passes(); ++pass) {
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            for (unsigned step = 0; step < values.steps(); ++step) {
+                count += values.has({pass, signal, step}) ? 1U : 0U;
+            }
+        }
+    }
+    return count;
+}
+
+/// "2 to 15", "alpha0 to alpha7, llr": `inRow` tells whether a number goes on from the one before it.
+template <class Name, class InRow>
+std::string listed(const std::vector<unsigned>& numbers, Name name, InRow inRow)
+{
+    std::string text;
+    for (std::size_t first = 0, last = 0; first < numbers.size(); first = ++last) {
+        while (last + 1 < numbers.size() && numbers[last + 1] == numbers[last] + 1 && inRow(numbers[last + 1])) {
+            ++last;
+        }
+        text += (text.empty() ? "" : ", ") + name(numbers[first]);
+        if (last > first) {
+            text += (last > first + 1 ? " to " : ", ") + name(numbers[last]);
+        }
+    }
+    return text;
+}
+
+std::string signalNames(const std::vector<unsigned>& signals)
+{
+    const auto name = [](unsigned signal) {
+        return std::string(passSignals[signal]);
+    };
+    const auto inRow = [](unsigned signal) {
+        return signalsOf(stageOf(signal)).first != signal;
+    };
+    return listed(signals, name, inRow);
+}
+
+std::string plural(const char* noun, std::size_t count)
+{
+    return noun + std::string(count == 1 ? " " : "s ");
+}
+
+}  // namespace
+
+Coverage coverageOf(const Model& model, const Dump& dump)
+{
+    Coverage coverage;
+    coverage.computed = countOf(model.values);
+    for (unsigned signal = 0; signal < signalCount; ++signal) {
+        if (!dump.given[signal]) {
+            coverage.absentSignals.push_back(signal);
+        }
+    }
+    for (unsigned pass = 0; pass < dump.values.passes(); ++pass) {
+        if (!hasPass(dump.values, pass)) {
+            coverage.absentPasses.push_back(pass);
+            continue;
+        }
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            if (dump.given[signal]) {
+                countGaps(model, dump.values, pass, signal, coverage);
+            }
+        }
+    }
+    std::sort(coverage.gapSignals.begin(), coverage.gapSignals.end());
+    const auto& absent = coverage.absentPasses;
+    if (!absent.empty() && absent.front() > 0 && absent.front() % 2 == 0 &&
+        absent.front() + absent.size() == dump.values.passes()) {
+        coverage.iterations = absent.front() / 2;
+    }
+    return coverage;
+}
+
+std::vector<std::string> lacksOf(const Coverage& coverage)
+{
+    std::vector<std::string> lacks;
+    if (!coverage.absentPasses.empty()) {
+        const auto number = [](unsigned pass) {
+            return std::to_string(pass);
+        };
+        lacks.push_back(plural("half-iteration", coverage.absentPasses.size()) +
+                        listed(coverage.absentPasses, number, [](unsigned) { return true; }));
+    }
+    if (coverage.firstGap) {
+        const Place& first = *coverage.firstGap;
+        lacks.push_back(std::to_string(coverage.gaps) + ' ' + plural("value", coverage.gaps) + "of " +
+                        signalNames(coverage.gapSignals) + "; the first is " + passSignals[first.signal] +
+                        " of half-iteration " + std::to_string(first.pass) + ", step " + std::to_string(first.step));
+    }
+    if (!coverage.absentSignals.empty()) {
+        lacks.push_back(plural("signal", coverage.absentSignals.size()) + signalNames(coverage.absentSignals));
+    }
+    return lacks;
+}
+
+}  // namespace morvik::comparison
