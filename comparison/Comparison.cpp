@@ -55,6 +55,9 @@ private:
         std::optional<Column> follows;
         for (unsigned i = 0; i < count; ++i) {
             const Place place = {pass, first + i, step};
+            if (itsDump.isCopy(place.signal)) {
+                continue;
+            }
             itsResult.signals[place.signal].unknown += itsDump.isUnknown(place) ? 1U : 0U;
             itsResult.signals[place.signal].missing += itsDump.at(place) == Values::missing ? 1U : 0U;
             if (counts(place)) {
@@ -101,7 +104,8 @@ private:
         for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
             for (unsigned i = 0; i < count; ++i) {
                 const Place place = {pass, first + i, step};
-                if (itsDump.has(place) && itsDump.at(place) != itsModel.values.at(place)) {
+                if (itsDump.has(place) && !itsDump.isCopy(place.signal) &&
+                    itsDump.at(place) != itsModel.values.at(place)) {
                     itsResult.faults.push_back({place, itsDump.at(place), itsModel.values.at(place)});
                 }
             }

@@ -94,7 +94,7 @@ Coverage coverageOf(const Model& model, const Dump& dump)
     coverage.computed = countOf(model.values);
     for (unsigned signal = 0; signal < signalCount; ++signal) {
         if (!dump.given[signal]) {
-            coverage.absentSignals.push_back(signal);
+            (dump.values.isCopy(signal) ? coverage.copiedSignals : coverage.absentSignals).push_back(signal);
         }
     }
     for (unsigned pass = 0; pass < dump.values.passes(); ++pass) {
@@ -135,6 +135,10 @@ std::vector<std::string> lacksOf(const Coverage& coverage)
     }
     if (!coverage.absentSignals.empty()) {
         lacks.push_back(plural("signal", coverage.absentSignals.size()) + signalNames(coverage.absentSignals));
+    }
+    for (const unsigned signal : coverage.copiedSignals) {
+        lacks.push_back(std::string("signal ") + passSignals[signal] + ", which is always " +
+                        passSignals[twinOf(signal)]);
     }
     return lacks;
 }

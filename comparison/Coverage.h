@@ -16,7 +16,8 @@ namespace morvik::comparison {
 /// A dump may lack signals. Of those that it has, it should have every value that the core computes.
 struct Coverage {
     std::uint64_t computed = 0;           ///< values of the core, whatever the dump has
-    std::vector<unsigned> absentSignals;  ///< places in passSignals
+    std::vector<unsigned> absentSignals;  ///< places in passSignals, without those for which their twin stands
+    std::vector<unsigned> copiedSignals;  ///< these
     std::vector<unsigned> absentPasses;   ///< half-iterations without any value
     std::uint64_t gaps = 0;               ///< values that half-iterations and signals of the dump lack
     std::optional<Place> firstGap;

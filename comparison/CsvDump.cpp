@@ -186,6 +186,7 @@ private:
 void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
 {
     CsvReader(input, name, map, dump).read();
+    completeTwins(name, map, dump);
 }
 
 }  // namespace morvik::comparison

@@ -48,6 +48,10 @@ void readCsv(std::istream& input, const std::string& name, const NameMap& map, D
 /// nothing. What is wrong is thrown as a simulation::Error that opens with the place.
 void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
+/// Has a branch metric of the dump stand for its twin, when the dump lacks that. Throws a simulation::Error when the
+/// map says that it does, and the dump has both.
+void completeTwins(const std::string& name, const NameMap& map, Dump& dump);
+
 }  // namespace morvik::comparison
 
 #endif

@@ -4,7 +4,9 @@
 #include <charconv>
 #include <system_error>
 
+#include "Dump.h"
 #include "Values.h"
+#include "simulation/Error.h"
 #include "simulation/Shown.h"
 
 namespace morvik::comparison {
@@ -30,6 +32,20 @@ std::int16_t DumpFile::value(std::string_view name, unsigned signal, std::string
              map.expectedNumber(signal));
     }
     return static_cast<std::int16_t>(*value);
+}
+
+void completeTwins(const std::string& name, const NameMap& map, Dump& dump)
+{
+    for (unsigned signal = 0; signal < signalCount; ++signal) {
+        const unsigned twin = twinOf(signal);
+        if (dump.given[signal] && dump.given[twin] && !map.standIns[signal].empty()) {
+            throw simulation::Error(name + ": has " + passSignals[signal] + ", for which " +
+                                    simulation::shown(map.standIns[signal]) + " stands in the map");
+        }
+        if (!dump.given[signal] && dump.given[twin]) {
+            dump.values.copyFromTwin(signal);
+        }
+    }
 }
 
 }  // namespace morvik::comparison

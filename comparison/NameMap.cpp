@@ -160,12 +160,28 @@ private:
             fail("\"signals\" is no object");
         }
         for (const auto& [theirs, ours] : value.items()) {
+            if (ours.is_array()) {
+                readTwins(theirs, ours, map);
+                continue;
+            }
             const auto signal = signalOf(ours);
             if (!signal && !ours.is_null()) {
                 fail("signal " + shown(theirs) + " is " + ours.dump() + ", allowed are " + signalNames + ", and null");
             }
             map.signals[theirs] = signal.value_or(NameMap::leftOut);
         }
+    }
+
+    void readTwins(const std::string& theirs, const Json& ours, NameMap& map) const
+    {
+        const auto signal = ours.size() == 2 ? signalOf(ours[0]) : std::nullopt;
+        if (!signal || twinOf(*signal) == *signal || signalOf(ours[1]) != twinOf(*signal)) {
+            fail("signal " + shown(theirs) +
+                 " is a list, allowed are two signals that are always equal: g0 and g3, or "
+                 "g1 and g2");
+        }
+        map.signals[theirs] = *signal;
+        map.standIns[twinOf(*signal)] = theirs;
     }
 
     void readColumns(const Json& value, NameMap& map) const

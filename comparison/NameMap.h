@@ -26,7 +26,8 @@ enum class NumberForm : std::uint8_t {
 
 /// Read from a JSON object, whose keys may all be left out:
 ///   "columns"   of CSV, or variables of VCD: {"half_iteration": NAME, "step": NAME, "signal": NAME, "value": NAME}
-///   "signals"   {NAME: SIGNAL or null, ...}: SIGNAL is one of passSignals; null leaves the signal out
+///   "signals"   {NAME: SIGNAL or null, ...}: SIGNAL is one of passSignals, or a list of two that are always equal;
+///               null leaves the signal out
 ///   "numbers"   auto, integer, unsigned, real, hex or binary
 ///   "bits"      of a number in two's complement, 12 when left out; or {SIGNAL: bits, ...}
 ///   "first_half_iteration", "first_step"   what the dump counts from, 0 when left out
@@ -40,6 +41,7 @@ struct NameMap {
     std::string signalColumn = "signal";
     std::string valueColumn = "value";
     std::map<std::string, unsigned, std::less<>> signals;  ///< to places in passSignals, or leftOut
+    std::array<std::string, passSignals.size()> standIns;  ///< names that stand for these signals, too
     NumberForm numbers = NumberForm::automatic;
     std::array<unsigned, passSignals.size()> bits;
     unsigned firstPass = 0;

@@ -42,6 +42,14 @@ constexpr Stage stageOf(unsigned signal)
     return found;
 }
 
+/// The branch metric that always equals this one, as the code has one parity bit for each data bit (rule 5): g3 is g0,
+/// and g2 is g1. Other signals have none and are returned.
+constexpr unsigned twinOf(unsigned signal)
+{
+    const SignalRange branch = signalsOf(Stage::branch);
+    return stageOf(signal) == Stage::branch ? 2 * branch.first + branch.count - 1 - signal : signal;
+}
+
 /// A value of a block: half-iteration, signal, trellis step.
 struct Place {
     unsigned pass;
@@ -98,10 +106,27 @@ public:
         itsValues[index(place)] = value;
     }
 
+    /// Has the values of the signal's twin stand for its own: they are inputs, and are not compared a second time.
+    void copyFromTwin(unsigned signal)
+    {
+        for (unsigned pass = 0; pass < itsPasses; ++pass) {
+            for (unsigned step = 0; step < itsSteps; ++step) {
+                set({pass, signal, step}, at({pass, twinOf(signal), step}));
+            }
+        }
+        itsCopies[signal] = true;
+    }
+
+    bool isCopy(unsigned signal) const
+    {
+        return itsCopies[signal];
+    }
+
 private:
     unsigned itsPasses;
     unsigned itsSteps;
     std::vector<std::int16_t> itsValues;
+    std::array<bool, signalCount> itsCopies = {};
 };
 
 }  // namespace morvik::comparison

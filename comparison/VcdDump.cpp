@@ -409,6 +409,7 @@ private:
 void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
 {
     VcdReader(input, name, map, dump).read();
+    completeTwins(name, map, dump);
 }
 
 }  // namespace morvik::comparison

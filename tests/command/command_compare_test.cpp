@@ -447,6 +447,30 @@ TEST_F(Compare, NeedsNoSignalAsAWhole)
     expectRefused(compare(), "rtl.csv: holds no value that the core computes");
 }
 
+TEST_F(Compare, NeedsTwoBranchMetricsToTellFaults)
+{
+    writeBlock(512);
+    writeDump("ratio_rounding", 2, 1);
+    const auto ofRatios = [](const std::string& report) {
+        const std::size_t start = report.find("\nllr ");
+        return report.substr(start, report.find('\n', start + 1) - start);
+    };
+    const std::string ratios = ofRatios(compare().out);
+    std::istringstream all(morvik.read("rtl.csv"));
+    std::string two;
+    for (std::string line; std::getline(all, line);) {
+        two += has(line, ",g2,") || has(line, ",g3,") ? "" : line + '\n';
+    }
+    morvik.write("rtl.csv", two);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "compared 8 of 8 half-iterations, 86104 of 94296 values: ")) << result.out;
+    EXPECT_TRUE(has(result.out, "\n  not in the dump: signal g2, which is always g1\n")) << result.out;
+    EXPECT_TRUE(has(result.out, "\nAll its inputs agree. At fault: the log-likelihood ratio")) << result.out;
+    EXPECT_EQ(ofRatios(result.out), ratios);
+    EXPECT_FALSE(has(result.out, "\ng3 ")) << result.out;
+}
+
 TEST_F(Compare, TellsWhatToDoWithATraceOfSomeHalfIterations)
 {
     writeBlock(40);

@@ -170,6 +170,31 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
                   mapOf(R"({"numbers": "hex"})"));
 }
 
+TEST(CsvDump, HasABranchMetricStandForItsTwin)
+{
+    constexpr unsigned g0 = 1;
+    constexpr unsigned g3 = 4;
+    const std::string text = header + "0,0,g0,5\n0,1,g0,x\n1,7,g0,-6\n";
+    const Dump dump = read(readCsv, text);
+    EXPECT_EQ(dump.values.at({0, g3, 0}), 5);
+    EXPECT_TRUE(dump.values.isUnknown({0, g3, 1}));
+    EXPECT_EQ(dump.values.at({1, g3, 7}), -6);
+    EXPECT_TRUE(dump.values.isCopy(g3));
+    EXPECT_FALSE(dump.given[g3]);
+    EXPECT_FALSE(dump.values.isCopy(g0));
+    EXPECT_FALSE(read(readCsv, text + "0,0,g3,5\n").values.isCopy(g3));
+    for (const char* const list : {R"(["g0", "g3"])", R"(["g3", "g0"])"}) {
+        const std::string json = std::string(R"({"signals": {"bm": )") + list + "}}";
+        const Dump mapped = read(readCsv, header + "0,0,bm,5\n", mapOf(json));
+        EXPECT_EQ(mapped.values.at({0, g0, 0}), 5);
+        EXPECT_EQ(mapped.values.at({0, g3, 0}), 5);
+    }
+    expectRefused(readCsv,
+                  header + "0,0,bm,5\n0,0,g3,5\n",
+                  R"(dump: has g3, for which "bm" stands in the map)",
+                  mapOf(R"({"signals": {"bm": ["g0", "g3"]}})"));
+}
+
 TEST(NameMap, NamesWhatIsWrong)
 {
     expectMapRefused("[]", "map.json: no map, expected a JSON object");
@@ -182,6 +207,13 @@ TEST(NameMap, NamesWhatIsWrong)
         R"({"signals": {"a": "alpha8"}})",
         "map.json: signal \"a\" is \"alpha8\", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to "
         "beta7, llr, extrinsic, and null");
+    for (const char* const list :
+         {"[]", R"(["g0"])", R"(["g0", "g1"])", R"(["llr", "llr"])", R"(["g0", "g3", "g3"])"}) {
+        expectMapRefused(
+            std::string(R"({"signals": {"bm": )") + list + "}}",
+            "map.json: signal \"bm\" is a list, allowed are two signals that are always equal: g0 and g3, or "
+            "g1 and g2");
+    }
     expectMapRefused(R"({"signals": 1})", "map.json: \"signals\" is no object");
     expectMapRefused(R"({"columns": {"row": "x"}})",
                      "map.json: column \"row\", allowed are half_iteration, step, signal, value");
