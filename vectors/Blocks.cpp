@@ -23,8 +23,8 @@ constexpr std::size_t mostRows = 3;
 /// The frames of random bits are numbered on from size to size; those of directed blocks have numbers of their own.
 constexpr std::uint64_t firstDirectedFrame = std::uint64_t{1} << 32;
 
-/// A soft value by its stream, 0 to 2, and its position.
-using Pattern = std::int8_t (*)(unsigned stream, unsigned position);
+/// A soft value by its stream, 0 to 2, its position, and whether that belongs to the tail.
+using Pattern = std::int8_t (*)(unsigned stream, unsigned position, bool isTail);
 
 struct NamedPattern {
     const char* name;
@@ -37,7 +37,7 @@ std::int8_t extreme(bool isHighest)
 }
 
 /// -1, 0 and 1, so small that metrics are often equal. The low bits of the product look random.
-std::int8_t tie(unsigned stream, unsigned position)
+std::int8_t tie(unsigned stream, unsigned position, bool)
 {
     const std::uint32_t mixed = (3 * position + stream + 1) * 2654435761U;  // 2^32 over the golden ratio
     return static_cast<std::int8_t>(static_cast<int>((mixed >> 16) % 3) - 1);
@@ -45,29 +45,33 @@ std::int8_t tie(unsigned stream, unsigned position)
 
 constexpr NamedPattern patterns[] = {
     {"zeros",
-     [](unsigned, unsigned) {
+     [](unsigned, unsigned, bool) {
          return std::int8_t{0};
      }},
     {"highest",
-     [](unsigned, unsigned) {
+     [](unsigned, unsigned, bool) {
          return highest;
      }},
     {"lowest",
-     [](unsigned, unsigned) {
+     [](unsigned, unsigned, bool) {
          return lowest;
      }},
     {"ties", tie},
     {"alternating_positions",
-     [](unsigned, unsigned position) {
+     [](unsigned, unsigned position, bool) {
          return extreme(position % 2 == 0);
      }},
     {"alternating_streams",
-     [](unsigned stream, unsigned position) {
+     [](unsigned stream, unsigned position, bool) {
          return extreme((stream + position) % 2 == 0);
      }},
     {"opposed_parities",
-     [](unsigned stream, unsigned) {
+     [](unsigned stream, unsigned, bool) {
          return extreme(stream != 1);
+     }},
+    {"opposed_tail",
+     [](unsigned, unsigned, bool isTail) {
+         return extreme(isTail);
      }},
 };
 
@@ -107,7 +111,7 @@ public:
         Stimulus stimulus{named.name, K, nextTag(), {}};
         for (unsigned stream = 0; stream < stimulus.streams.size(); ++stream) {
             for (unsigned position = 0; position < K + tailPositions; ++position) {
-                stimulus.streams[stream].push_back(named.pattern(stream, position));
+                stimulus.streams[stream].push_back(named.pattern(stream, position, position >= K));
             }
         }
         itsTake(stimulus);

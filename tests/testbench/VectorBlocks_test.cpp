@@ -93,6 +93,7 @@ TEST(VectorBlocks, HaveEachPatternForEachSize)
                                    "alternating_positions",
                                    "alternating_streams",
                                    "opposed_parities",
+                                   "opposed_tail",
                                    "saturated_code_word"}) {
         EXPECT_EQ(sizes[name], (std::set<unsigned>{40, 128})) << name;
     }
@@ -123,6 +124,9 @@ TEST(VectorBlocks, HoldTheValuesThatTheirNamesSay)
     const Stimulus opposed = named(smallSet(), "opposed_parities");
     EXPECT_EQ(opposed.streams[1][7], -128);
     EXPECT_EQ(opposed.streams[2][7], 127);
+    for (const auto& stream : named(smallSet(), "opposed_tail").streams) {
+        EXPECT_EQ(std::vector<int>(stream.end() - 5, stream.end()), (std::vector<int>{-128, 127, 127, 127, 127}));
+    }
 }
 
 TEST(VectorBlocks, HaveASizeOnEachSideOfAnEdge)
