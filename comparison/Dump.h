@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <istream>
 #include <map>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -14,6 +15,17 @@
 #include "Values.h"
 
 namespace morvik::comparison {
+
+/// Where the values of a value change dump come from, by their places.
+struct Waveform {
+    explicit Waveform(std::size_t places) : times(places, 0), variables(places, 0) {}
+
+    std::vector<std::uint64_t> times;
+    std::vector<unsigned> variables;
+    std::map<unsigned, std::string> names;  ///< of variables, with the scopes that they are in
+    std::string unit;                       ///< of times; empty when the dump does not tell
+    std::vector<std::string> notes;         ///< what the map has chosen
+};
 
 /// Values and the lines they come from.
 struct Dump {
@@ -33,6 +45,7 @@ struct Dump {
 
     Values values;
     std::vector<std::uint32_t> lines;
+    std::optional<Waveform> waveform;
     std::array<bool, signalCount> given = {};  ///< signals that have a column, a row or a variable
 };
 

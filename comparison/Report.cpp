@@ -111,6 +111,9 @@ private:
         if (itsComparison.ignoresUnknown && itsComparison.unknown() > 0) {
             itsText += "  ignored: " + counted(itsComparison.unknown(), "unknown value") + " (x)\n";
         }
+        for (const std::string& each : itsDump.waveform ? itsDump.waveform->notes : std::vector<std::string>()) {
+            itsText += "  by the map: " + each + '\n';
+        }
         for (const std::string& each : lacksOf(coverage)) {
             itsText += "  not in the dump: " + each + '\n';
         }
@@ -124,6 +127,19 @@ private:
             itsText += format("; for a simulation of fewer iterations, give --iterations %u", *coverage.iterations);
         }
         itsText += ".\n";
+    }
+
+    /// Where the dump has the value, and in a waveform of what and when.
+    void addSource(const Place& place)
+    {
+        if (!itsDump.waveform) {
+            return;
+        }
+        const Waveform& waveform = *itsDump.waveform;
+        const std::size_t index = itsDump.values.index(place);
+        itsText += "  variable        " + waveform.names.at(waveform.variables[index]) + '\n';
+        itsText += "  time            " + (waveform.unit.empty() ? "#" : std::string()) +
+                   std::to_string(waveform.times[index]) + (waveform.unit.empty() ? "" : ' ' + waveform.unit) + '\n';
     }
 
     void addPlace(const Place& place)
@@ -143,7 +159,9 @@ private:
         itsText += format(
             "  window          %u of %u, steps %u to %u\n", where.window, windows.rows, window.first, window.last);
         itsText += format("  trellis step    %u, %s\n", place.step, bitText(place).c_str());
-        itsText += format("  signal          %s\n\n", passSignals[place.signal]);
+        itsText += format("  signal          %s\n", passSignals[place.signal]);
+        addSource(place);
+        itsText += '\n';
     }
 
     std::string bitText(const Place& place) const

@@ -1,10 +1,11 @@
 // VcdDump: dumps as value change dumps (IEEE 1364, clause 18).
 #include <algorithm>
 #include <array>
-#include <cmath>
+#include <charconv>
 #include <cstddef>
 #include <cstdint>
 #include <iterator>
+#include <limits>
 #include <map>
 #include <optional>
 #include <string>
@@ -13,6 +14,8 @@
 
 #include "Dump.h"
 #include "DumpFile.h"
+#include "VcdScopes.h"
+#include "simulation/Error.h"
 #include "simulation/Shown.h"
 
 namespace morvik::comparison {
@@ -20,11 +23,6 @@ namespace morvik::comparison {
 namespace {
 
 using simulation::shown;
-
-/// What a scope's values belong to, and whether they count.
-enum class Role : std::uint8_t { pass, step, valid, signal };
-
-constexpr unsigned nobody = ~0U;
 
 /// A digit of a vector: 0, 1, or unknown. VHDL has nine states (IEEE 1076, package std_logic_1164), L and H weak 0
 /// and 1.
@@ -40,32 +38,18 @@ Digit digitOf(char character)
     return static_cast<Digit>(kind);
 }
 
-/// The variables of a scope that count. Those of a scope around it stand for what it lacks itself.
-struct Scope {
-    std::string name;
-    unsigned parent = nobody;
-    unsigned pass = nobody;  // variables
-    unsigned step = nobody;
-    unsigned valid = nobody;
-    std::vector<unsigned> signals;  // variables
-    bool changed = false;
-};
-
-struct Variable {
-    std::string name;
-    unsigned scope = 0;
-    Role role = Role::signal;
-    unsigned signal = 0;
-    unsigned bits = 0;
-    std::optional<std::int64_t> value;  ///< none while unknown
-    std::uint32_t line = 0;             ///< where it has changed
+/// Multiples and unit of the dump's time, "10ps".
+struct Timescale {
+    std::uint64_t factor = 1;
+    std::string unit;
 };
 
 class VcdReader {
 public:
     VcdReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
-        : itsFile(input, name), itsMap(map), itsDump(dump)
+        : itsFile(input, name), itsMap(map), itsDump(dump), itsScopes(map)
     {
+        dump.waveform.emplace(dump.lines.size());
     }
 
     void read()
@@ -75,14 +59,15 @@ public:
                 readCommand();
             } else if (itsWord[0] == '#') {
                 keepChanges();
+                readTime();
             } else {
                 readChange();
             }
         }
+        endDeclarations();
         keepChanges();
-        if (!itsAnySignal) {
-            itsFile.fail("no variable of the dump is a signal that is known; a map tells which is which");
-        }
+        itsDump.waveform->notes = itsScopes.notes();
+        itsDump.waveform->unit = itsTimescale.unit;
     }
 
 private:
@@ -125,6 +110,15 @@ private:
         }
     }
 
+    /// Has what is wrong told with its place.
+    template <class Action>
+    auto placed(Action action)
+    try {
+        return action();
+    } catch (const simulation::Error& error) {
+        itsFile.fail(error.what());
+    }
+
     void readCommand()
     {
         const std::string command(itsWord);
@@ -133,14 +127,14 @@ private:
         }
         if (command == "$scope") {
             expectWord("the kind of a scope");
-            enterScope(expectWord("the name of a scope"));
+            itsScopes.enter(expectWord("the name of a scope"));
         } else if (command == "$upscope") {
-            if (itsScope == nobody) {
-                itsFile.fail("$upscope outside of all scopes");
-            }
-            itsScope = itsScopes[itsScope].parent;
+            placed([this] { itsScopes.leave(); });
         } else if (command == "$var") {
             readVariable();
+            return;
+        } else if (command == "$timescale") {
+            readTimescale(restOfCommand());
             return;
         } else if (command == "$dumpoff") {
             forgetAll();
@@ -148,47 +142,54 @@ private:
         restOfCommand();
     }
 
-    /// A dump may come back to a scope that it has left.
-    void enterScope(const std::string& name)
-    {
-        unsigned scope = 0;
-        while (scope < itsScopes.size() && (itsScopes[scope].parent != itsScope || itsScopes[scope].name != name)) {
-            ++scope;
-        }
-        if (scope == itsScopes.size()) {
-            Scope entered;
-            entered.name = name;
-            entered.parent = itsScope;
-            itsScopes.push_back(entered);
-        }
-        itsScope = scope;
-    }
-
     void forgetAll()
     {
-        for (Variable& variable : itsVariables) {
+        for (VcdVariable& variable : itsScopes.variables()) {
             variable.value.reset();
         }
     }
 
+    void readTimescale(const std::string& text)
+    {
+        const std::size_t digits = std::min(text.find_first_not_of("0123456789"), text.size());
+        std::uint64_t factor = 0;
+        const auto result = std::from_chars(text.data(), text.data() + digits, factor);
+        const std::string unit = text.substr(digits);
+        constexpr std::array<std::string_view, 6> units = {"s", "ms", "us", "ns", "ps", "fs"};
+        if (result.ec != std::errc() || factor == 0 || std::find(units.begin(), units.end(), unit) == units.end()) {
+            itsFile.fail("timescale " + shown(text) +
+                         " is not allowed, expected 1, 10 or 100 and s, ms, us, ns, ps or fs");
+        }
+        itsTimescale = {factor, unit};
+    }
+
+    void readTime()
+    {
+        const std::string_view digits = itsWord.substr(1);
+        const char* const end = digits.data() + digits.size();
+        const auto result = std::from_chars(digits.data(), end, itsTime);
+        if (result.ec != std::errc() || result.ptr != end ||
+            itsTime > std::numeric_limits<std::uint64_t>::max() / itsTimescale.factor) {
+            itsFile.fail(shown(itsWord) + " is no time");
+        }
+        itsTime *= itsTimescale.factor;
+    }
+
     void readVariable()
     {
-        Variable variable;
+        VcdVariable variable;
         expectWord("the kind of a variable");
         const std::string width = expectWord("the width of a variable");
         const std::string identifier = expectWord("the identifier of a variable");
         variable.name = expectWord("the name of a variable");
         variable.name = plainName(variable.name + restOfCommand());
-        if (itsScope == nobody) {
-            itsFile.fail("variable " + shown(variable.name) + " outside of all scopes");
+        if (itsIsDeclared) {
+            itsFile.fail("variable " + shown(variable.name) + " behind the first values");
         }
-        variable.scope = itsScope;
-        if (takesPart(variable)) {
-            variable.bits = itsFile.count("width", width, 1, 65536) + 1;
-            itsByIdentifier[identifier].push_back(static_cast<unsigned>(itsVariables.size()));
-            itsVariables.push_back(variable);
-        } else {
-            itsByIdentifier[identifier];  // so that its changes are known to be of a variable
+        variable.net = static_cast<unsigned>(itsNets.size());
+        variable.net = itsNets.try_emplace(identifier, variable.net).first->second;
+        if (placed([&] { return itsScopes.declare(variable); })) {
+            itsScopes.variables().back().bits = itsFile.count("width", width, 1, 65536) + 1;
         }
     }
 
@@ -203,103 +204,86 @@ private:
         return name;
     }
 
-    /// The variable's name, and the same behind the scope that it is in, behind the one around that, and so on.
-    std::vector<std::string> namesOf(const Variable& variable) const
+    /// Chooses the variables that count, and finds out which scopes depend on them.
+    void endDeclarations()
     {
-        std::vector<std::string> names = {variable.name};
-        for (unsigned scope = variable.scope; scope != nobody; scope = itsScopes[scope].parent) {
-            names.push_back(itsScopes[scope].name + '.' + names.back());
+        if (itsIsDeclared) {
+            return;
         }
-        return names;
-    }
-
-    /// What the longest name that the map has says of the variable.
-    std::optional<unsigned> signalOf(const std::vector<std::string>& names) const
-    {
-        std::optional<unsigned> signal;
-        for (const std::string& name : names) {
-            const auto known = itsMap.signal(name);
-            signal = known ? known : signal;
+        itsIsDeclared = true;
+        placed([this] { itsScopes.choose(); });
+        const auto& scopes = itsScopes.scopes();
+        itsDependents.resize(itsScopes.variables().size());
+        itsHasChanged.resize(scopes.size());
+        for (unsigned scope = 0; scope < scopes.size(); ++scope) {
+            if (scopes[scope].signals.empty()) {
+                continue;
+            }
+            for (const unsigned each : {scopes[scope].pass, scopes[scope].step, scopes[scope].valid}) {
+                if (each != nobody) {
+                    itsDependents[each].push_back(scope);
+                }
+            }
+            for (const unsigned each : scopes[scope].signals) {
+                itsDependents[each].push_back(scope);
+                itsDump.given[itsScopes.variables()[each].signal] = true;
+            }
         }
-        return signal;
-    }
-
-    /// Finds out what the variable is for; false when it does not count.
-    bool takesPart(Variable& variable)
-    {
-        Scope& scope = itsScopes[variable.scope];
-        const auto number = static_cast<unsigned>(itsVariables.size());
-        const std::vector<std::string> names = namesOf(variable);
-        const auto isCalled = [&names](const std::string& name) {
-            return std::find(names.begin(), names.end(), name) != names.end();
-        };
-        const auto signal = signalOf(names);
-        if (isCalled(itsMap.passColumn)) {
-            variable.role = Role::pass;
-            scope.pass = number;
-        } else if (isCalled(itsMap.stepColumn)) {
-            variable.role = Role::step;
-            scope.step = number;
-        } else if (!itsMap.valid.empty() && isCalled(itsMap.valid)) {
-            variable.role = Role::valid;
-            scope.valid = number;
-        } else if (signal && *signal != NameMap::leftOut) {
-            variable.signal = *signal;
-            scope.signals.push_back(number);
-            itsDump.given[*signal] = true;
-            itsAnySignal = true;
-        } else {
-            return false;
+        if (std::find(itsDump.given.begin(), itsDump.given.end(), true) == itsDump.given.end()) {
+            itsFile.fail("no variable of the dump is a signal that is known; a map tells which is which");
         }
-        return true;
+        itsOfNet.resize(itsNets.size());
+        for (unsigned variable = 0; variable < itsDependents.size(); ++variable) {
+            if (!itsDependents[variable].empty()) {
+                itsOfNet[itsScopes.variables()[variable].net].push_back(variable);
+            }
+        }
     }
 
     void readChange()
     {
-        std::string digits(itsWord);
-        std::string identifier;
+        endDeclarations();
+        std::string_view digits = itsWord;
+        std::string_view identifier;
+        std::string kept;
         const char kind = digits[0];
         if (kind == 'b' || kind == 'B' || kind == 'r' || kind == 'R') {
-            digits.erase(0, 1);
-            identifier = expectWord("the identifier of a variable");
+            kept = digits.substr(1);
+            digits = kept;
+            expectWord("the identifier of a variable");
+            identifier = itsWord;
         } else if (digitOf(kind) != Digit::none) {
             identifier = digits.substr(1);
-            digits.resize(1);
+            digits = digits.substr(0, 1);
         } else if (kind == 's' || kind == 'S') {
             expectWord("the identifier of a variable");
             return;  // a text
         } else {
             itsFile.fail(shown(itsWord) + " is no change of a value");
         }
-        const auto found = itsByIdentifier.find(identifier);
-        if (found == itsByIdentifier.end()) {
+        const auto found = itsNets.find(identifier);
+        if (found == itsNets.end()) {
             itsFile.fail("no variable has the identifier " + shown(identifier));
         }
-        for (const unsigned number : found->second) {
-            change(itsVariables[number], digits, kind == 'r' || kind == 'R');
+        for (const unsigned number : itsOfNet[found->second]) {
+            change(number, digits, kind == 'r' || kind == 'R');
         }
     }
 
-    void change(Variable& variable, const std::string& digits, bool isReal)
+    void change(unsigned number, std::string_view digits, bool isReal)
     {
+        VcdVariable& variable = itsScopes.variables()[number];
         variable.value = isReal ? realValue(variable, digits) : bitsValue(variable, digits);
         variable.line = itsFile.number();
-        itsScopes[variable.scope].changed = true;
-        // What a scope says of its place holds for those in it, too, and they come behind it.
-        for (std::size_t i = variable.scope; variable.role != Role::signal && i < itsScopes.size(); ++i) {
-            itsScopes[i].changed = itsScopes[i].changed || isInside(i, variable.scope);
+        for (const unsigned scope : itsDependents[number]) {
+            if (!itsHasChanged[scope]) {
+                itsHasChanged[scope] = true;
+                itsChanged.push_back(scope);
+            }
         }
     }
 
-    bool isInside(std::size_t scope, unsigned outer) const
-    {
-        while (scope != nobody && scope != outer) {
-            scope = itsScopes[scope].parent;
-        }
-        return scope == outer;
-    }
-
-    std::int64_t realValue(const Variable& variable, const std::string& digits) const
+    std::int64_t realValue(const VcdVariable& variable, std::string_view digits) const
     {
         NameMap reals;
         reals.numbers = NumberForm::real;
@@ -313,7 +297,7 @@ private:
     }
 
     /// Leading digits that a dump leaves out are 0 (or, behind x and z, unknown as well).
-    std::optional<std::int64_t> bitsValue(const Variable& variable, const std::string& digits) const
+    std::optional<std::int64_t> bitsValue(const VcdVariable& variable, std::string_view digits) const
     {
         std::int64_t value = 0;
         for (const char character : digits) {
@@ -334,74 +318,84 @@ private:
         return isNegative ? value - (std::int64_t{1} << digits.size()) : value;
     }
 
-    /// The variable of a scope, or of the closest scope around it that has one.
-    template <class Member>
-    const Variable* find(unsigned scope, Member member) const
-    {
-        for (; scope != nobody; scope = itsScopes[scope].parent) {
-            if (itsScopes[scope].*member != nobody) {
-                return &itsVariables[itsScopes[scope].*member];
-            }
-        }
-        return nullptr;
-    }
-
     void keepChanges()
     {
-        for (std::size_t i = 0; i < itsScopes.size(); ++i) {
-            if (itsScopes[i].changed && !itsScopes[i].signals.empty()) {
-                keep(static_cast<unsigned>(i));
-            }
-            itsScopes[i].changed = false;
+        std::sort(itsChanged.begin(), itsChanged.end());
+        for (const unsigned scope : itsChanged) {
+            keep(itsScopes.scopes()[scope]);
+            itsHasChanged[scope] = false;
         }
+        itsChanged.clear();
     }
 
-    void keep(unsigned scope)
+    /// The value of a pass, step or valid variable, if it is known.
+    std::optional<std::int64_t> valueOf(unsigned variable) const
     {
-        const Variable* const pass = find(scope, &Scope::pass);
-        const Variable* const step = find(scope, &Scope::step);
-        const Variable* const valid = find(scope, &Scope::valid);
-        if (pass == nullptr || step == nullptr) {
-            itsFile.fail("no variable " + shown(pass == nullptr ? itsMap.passColumn : itsMap.stepColumn) +
-                         " in the scope of " + shown(itsVariables[itsScopes[scope].signals.front()].name) +
-                         " or around it");
-        }
-        if (!pass->value || !step->value || (valid != nullptr && valid->value.value_or(0) != 1)) {
+        return itsScopes.variables()[variable].value;
+    }
+
+    void keep(const VcdScope& scope)
+    {
+        const auto pass = valueOf(scope.pass);
+        const auto step = valueOf(scope.step);
+        if (!pass || !step || (scope.valid != nobody && valueOf(scope.valid).value_or(0) != 1)) {
             return;
         }
         const unsigned h =
-            itsFile.count("half-iteration", std::to_string(*pass->value), itsMap.firstPass, itsDump.values.passes());
-        const unsigned n =
-            itsFile.count("step", std::to_string(*step->value), itsMap.firstStep, itsDump.values.steps());
-        for (const unsigned number : itsScopes[scope].signals) {
-            const Variable& variable = itsVariables[number];
-            const Place place = {h, variable.signal, n};
-            if (!variable.value && !itsDump.values.has(place)) {
-                itsDump.values.set(place, Values::unknown);
-                itsDump.lineOf(place) = itsFile.number();
-            }
-            if (!variable.value) {
-                continue;
-            }
-            if (*variable.value < Values::smallest || *variable.value > Values::largest) {
-                itsFile.fail(variable.name + ' ' + std::to_string(*variable.value) +
-                             " is not allowed, expected -2048 to 2047 eighths");
-            }
-            itsDump.values.set(place, static_cast<std::int16_t>(*variable.value));
-            itsDump.lineOf(place) = variable.line;
+            itsFile.count("half-iteration", std::to_string(*pass), itsMap.firstPass, itsDump.values.passes());
+        const unsigned n = itsFile.count("step", std::to_string(*step), itsMap.firstStep, itsDump.values.steps());
+        for (const unsigned number : scope.signals) {
+            keepValue(number, {h, itsScopes.variables()[number].signal, n});
         }
+    }
+
+    /// The last known value of a place counts.
+    void keepValue(unsigned number, const Place& place)
+    {
+        const VcdVariable& variable = itsScopes.variables()[number];
+        Waveform& waveform = *itsDump.waveform;
+        unsigned& owner = waveform.variables[itsDump.values.index(place)];
+        const bool has = itsDump.values.has(place);
+        if (!variable.value && has) {
+            return;
+        }
+        if (variable.value && (*variable.value < Values::smallest || *variable.value > Values::largest)) {
+            itsFile.fail(variable.name + ' ' + std::to_string(*variable.value) +
+                         " is not allowed, expected -2048 to 2047 eighths");
+        }
+        if (has && itsScopes.variables()[owner].net != variable.net) {
+            failAboutOwner(itsScopes.variables()[owner], variable, place);
+        }
+        itsDump.values.set(place, variable.value ? static_cast<std::int16_t>(*variable.value) : Values::unknown);
+        itsDump.lineOf(place) = variable.value ? variable.line : itsFile.number();
+        owner = number;
+        waveform.times[itsDump.values.index(place)] = itsTime;
+        if (waveform.names.find(number) == waveform.names.end()) {
+            waveform.names[number] = itsScopes.pathOf(variable);
+        }
+    }
+
+    [[noreturn]] void failAboutOwner(const VcdVariable& one, const VcdVariable& other, const Place& place) const
+    {
+        itsFile.fail(itsScopes.pathOf(one) + " and " + itsScopes.pathOf(other) + " both have " +
+                     passSignals[place.signal] + " of half-iteration " + std::to_string(place.pass) + ", step " +
+                     std::to_string(place.step) + "; a map chooses one, or tells by \"valid\" when they count");
     }
 
     DumpFile itsFile;
     const NameMap& itsMap;
     Dump& itsDump;
+    VcdScopes itsScopes;
     std::string_view itsRest;
     std::string_view itsWord;
-    std::vector<Scope> itsScopes;
-    unsigned itsScope = nobody;
-    std::vector<Variable> itsVariables;
-    std::map<std::string, std::vector<unsigned>, std::less<>> itsByIdentifier;
-    bool itsAnySignal = false;
+    Timescale itsTimescale;
+    std::uint64_t itsTime = 0;  // in the timescale's unit
+    bool itsIsDeclared = false;
+    std::map<std::string, unsigned, std::less<>> itsNets;  // by identifier
+    std::vector<std::vector<unsigned>> itsOfNet;           // variables that count
+    std::vector<std::vector<unsigned>> itsDependents;      // scopes whose values a variable changes
+    std::vector<unsigned> itsChanged;                      // scopes, since the last time
+    std::vector<bool> itsHasChanged;
 };
 
 }  // namespace

@@ -226,8 +226,34 @@ TEST_F(Compare, FindsAFaultInAWaveform)
         morvik.run({"compare", "--block", "block.csv", "--iterations", "4", "--dump", "trace.vcd"});
     EXPECT_EQ(result.status, 1);
     EXPECT_TRUE(has(result.out, "  trellis step    5, bit")) << result.out;
+    EXPECT_TRUE(has(result.out, "\n  variable        morvik.unit0.thread0.llr\n  time            5 ns\n"))
+        << result.out;
     EXPECT_TRUE(has(result.out, "At fault: the log-likelihood ratio (rule 8).")) << result.out;
     EXPECT_TRUE(has(result.out, "Found in log-likelihood ratios, 1 fault, at one place alone:\n")) << result.out;
+}
+
+TEST_F(Compare, TellsWhichVariableAMapHasChosen)
+{
+    writeBlock(40);
+    morvik.run({"trace", "block.csv", "--iterations", "4", "--format", "vcd", "--output", "rtl.vcd"});
+    std::string text = morvik.read("rtl.vcd");
+    text.insert(text.find("$upscope"), "$scope module port $end\n$var wire 12 ~~ llr $end\n$upscope $end\n");
+    morvik.write("rtl.vcd", text);
+    const auto compareVcd = [this](const std::vector<std::string>& options) {
+        std::vector<std::string> arguments = {
+            "compare", "--block", "block.csv", "--dump", "rtl.vcd", "--iterations", "4"};
+        arguments.insert(arguments.end(), options.begin(), options.end());
+        return morvik.run(arguments);
+    };
+    const CommandResult twice = compareVcd({});
+    EXPECT_EQ(twice.status, 2);
+    EXPECT_TRUE(has(twice.err, ": two variables are llr, morvik.unit0.thread0.llr and morvik.unit0.thread0.port.llr;"))
+        << twice.err;
+    morvik.write("map.json", R"({"signals": {"unit0.thread0.llr": "llr"}})");
+    const CommandResult chosen = compareVcd({"--map", "map.json"});
+    EXPECT_EQ(chosen.status, 0) << chosen.out;
+    EXPECT_TRUE(has(chosen.out, "\n  by the map: llr is morvik.unit0.thread0.llr, not morvik.unit0.thread0.port.llr\n"))
+        << chosen.out;
 }
 
 TEST_F(Compare, TellsWhatADumpOfRatiosAloneTells)

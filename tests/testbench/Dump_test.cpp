@@ -311,6 +311,100 @@ TEST(VcdDump, ReadsTheNineStatesOfVhdl)
     EXPECT_EQ(dump.values.at({0, llr, 2}), -2);
 }
 
+/// What a simulator writes of a test bench and a core in it, with a port that is a net of its own.
+std::string portOf(const std::string& declarations)
+{
+    return "$timescale 10 ps $end\n$scope module tb $end\n$var reg 5 h half_iteration $end\n$var reg 13 s step $end\n"
+           "$var wire 12 l llr $end\n$scope module core $end\n" +
+           declarations +
+           "$upscope $end\n$upscope $end\n$enddefinitions $end\n"
+           "#0\nb0 h\nb0 s\nb101 l\nb110 p\n#125\nb1 s\n#126\nb111 l\nb1000 p\n";
+}
+
+TEST(VcdDump, RefusesTwoVariablesForASignal)
+{
+    const std::string twice =
+        "two variables are llr, tb.llr and tb.core.llr; a map chooses: "
+        R"({"signals": {"tb.core.llr": "llr"}})";
+    const std::string port = "$var wire 12 p llr [11:0] $end\n";
+    expectRefused(readVcd, portOf(port), "dump:12: " + twice);
+    expectRefused(readVcd, portOf(port + "$var wire 13 t step $end\n"), "dump:13: " + twice);
+    expectRefused(readVcd,
+                  portOf("$var wire 12 p data $end\n"),
+                  "dump:12: two variables are llr, tb.llr and tb.core.data; a map chooses: "
+                  R"({"signals": {"tb.core.data": "llr"}})",
+                  mapOf(R"({"signals": {"data": "llr"}})"));
+}
+
+TEST(VcdDump, TakesTheVariableThatAMapNamesWithItsScopes)
+{
+    const std::string text = portOf("$var wire 12 p llr [11:0] $end\n");
+    const Dump inner = read(readVcd, text, mapOf(R"({"signals": {"tb.core.llr": "llr"}})"));
+    EXPECT_EQ(inner.values.at({0, llr, 0}), 6);
+    EXPECT_EQ(inner.values.at({0, llr, 1}), 8);
+    EXPECT_EQ(inner.waveform->notes, std::vector<std::string>{"llr is tb.core.llr, not tb.llr"});
+    const Dump outer = read(readVcd, text, mapOf(R"({"signals": {"tb.llr": "llr"}})"));
+    EXPECT_EQ(outer.values.at({0, llr, 1}), 7);
+    EXPECT_EQ(outer.waveform->notes, std::vector<std::string>{"llr is tb.llr, not tb.core.llr"});
+    const Dump without = read(readVcd, text, mapOf(R"({"signals": {"tb.llr": null}})"));
+    EXPECT_EQ(without.values.at({0, llr, 1}), 8);
+}
+
+TEST(VcdDump, TakesANetOnceInHoweverManyScopes)
+{
+    const Dump dump = read(readVcd, portOf("$var wire 12 l llr $end\n$var wire 12 p data $end\n"));
+    EXPECT_EQ(dump.values.at({0, llr, 0}), 5);
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 7);
+    EXPECT_EQ(dump.waveform->names, (std::map<unsigned, std::string>{{2, "tb.llr"}}));
+    const Dump valid =
+        read(readVcd,
+             portOf("$var wire 12 l llr $end\n$var wire 1 v ok $end\n$var wire 12 p data $end\n") + "#127\n1v\n",
+             mapOf(R"({"valid": "ok"})"));
+    EXPECT_EQ(valid.values.at({0, llr, 0}), Values::missing);
+    EXPECT_EQ(valid.values.at({0, llr, 1}), 7);
+}
+
+TEST(VcdDump, TellsVariableAndTimeOfAValue)
+{
+    const Dump dump = read(readVcd, portOf("$var wire 12 p data $end\n"));
+    const std::size_t index = dump.values.index({0, llr, 1});
+    EXPECT_EQ(dump.waveform->times[index], 1260U);
+    EXPECT_EQ(dump.waveform->unit, "ps");
+    EXPECT_EQ(dump.waveform->names.at(dump.waveform->variables[index]), "tb.llr");
+}
+
+TEST(VcdDump, RefusesTwoScopesWithTheSameRow)
+{
+    const auto scope = [](const std::string& name, const std::string& mark) {
+        return "$scope module " + name + " $end\n$var wire 5 h" + mark + " half_iteration $end\n$var wire 13 s" + mark +
+               " step $end\n$var wire 12 l" + mark + " llr $end\n$upscope $end\n";
+    };
+    const std::string start =
+        "$scope module tb $end\n" + scope("dut", "1") + scope("ref", "2") +
+        "$upscope $end\n$enddefinitions $end\n#0\nb0 h1\nb0 h2\nb0 s1\nb1 s2\nb101 l1\nb110 l2\n#1\n";
+    EXPECT_EQ(read(readVcd, start + "b10 s1\nb11 s2\n").values.at({0, llr, 3}), 6);
+    expectRefused(readVcd,
+                  start + "b1 s1\nb10 s2\n",
+                  "dump:23: tb.ref.llr and tb.dut.llr both have llr of half-iteration 0, step 1; a map chooses one, or "
+                  "tells by \"valid\" when they count");
+    EXPECT_EQ(read(readVcd, start + "b1 s1\nbx l1\n").values.at({0, llr, 1}), 6);
+}
+
+/// With the names of all scopes around each variable, this would take gigabytes.
+TEST(VcdDump, ReadsScopesHoweverDeep)
+{
+    constexpr unsigned depth = 20000;
+    std::string text = "$scope module tb $end\n$var wire 5 h half_iteration $end\n$var wire 13 s step $end\n";
+    for (unsigned i = 0; i < depth; ++i) {
+        text += "$scope module s" + std::to_string(i) + " $end\n$var wire 1 c clk $end\n";
+    }
+    const Dump dump = read(readVcd, text + "$var wire 12 l llr $end\n#7\nb0 h\nb1 s\nb11 l\n");
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 3);
+    const std::string name = dump.waveform->names.begin()->second;
+    EXPECT_EQ(name.substr(0, 3), "...");
+    EXPECT_EQ(name.size(), 203U);
+}
+
 /// A ratio that is x but for two steps; in the second, without v.
 const std::string pipeline = R"($scope module core $end
 $var integer 32 h half_iteration $end
@@ -401,7 +495,16 @@ TEST(VcdDump, NamesThePlaceOfAMistake)
                   "dump:5: no variable of the dump is a signal that is known; a map tells which is which");
     expectRefused(readVcd,
                   start + ratio + end + "#0\nb1 s\nb1 l\n",
-                  R"(dump:8: no variable "half_iteration" in the scope of "llr" or around it)");
+                  R"(dump:7: no variable "half_iteration" in the scope of "core.llr" or around it)");
+    expectRefused(readVcd,
+                  "$timescale 1 hour $end\n",
+                  R"(dump:1: timescale "1hour" is not allowed, expected 1, 10 or 100 and s, ms, us, ns, ps or fs)");
+    expectRefused(readVcd, start + pass + ratio + end + "#1x\n", R"(dump:7: "#1x" is no time)");
+    expectRefused(
+        readVcd, start + pass + ratio + "#0\nb0 h\n" + ratio, R"(dump:7: variable "llr" behind the first values)");
+    expectRefused(readVcd,
+                  start + pass + ratio + "$var wire 5 k half_iteration $end\n",
+                  R"(dump:5: two variables are "core.half_iteration")");
     expectRefused(readVcd, start + pass + ratio + end + "#0\nb1 q\n", R"(dump:8: no variable has the identifier "q")");
     expectRefused(readVcd, start + pass + ratio + end + "hello\n", R"(dump:7: "hello" is no change of a value)");
     expectRefused(readVcd, start + "$comment", "dump:3: a command without $end");
