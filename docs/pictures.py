@@ -357,7 +357,7 @@ def flow():
                           text(way.middle + side * 8, end + 40, label, "end" if side < 0 else "start", "small")]
 
     left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/SimulationCall.cpp: loadLanes",
-                                "src/LanePath.cpp: prepare, segmentCount, windowStarts"),
+                                "src/LanePath.cpp: takes, prepare, segmentCount, windowStarts"),
                           ("A row for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
                            "lanes/Transpose.h: loadRows"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",

@@ -69,8 +69,8 @@ typedef struct veltra_ip_morvik_v1_0_batch_outputs {
  *     ERROR:decoder:Insufficient allocated space for ratios array
  *     ERROR:decoder:Insufficient allocated space for tags array
  *
- * Input arrays must not overlap output arrays. Memory exhausted while soft values are taken in leaves the
- * function as a C++ exception, as in the single call.
+ * Input arrays must not overlap output arrays. All arrays may begin at any address. Exhausted memory is
+ * always status 99; no function of this header lets a C++ exception out.
  */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_simulate_i32(veltra_ip_morvik_v1_0_state* state,
                                                             const int32_t* rsc1_sys,
@@ -167,18 +167,24 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i8(veltra_ip_morvik_
  *
  *     avx512, avx2, ssse3    one lane for each segment of a block, on vectors of that instruction set
  *     generic                the same on what every machine has
- *     component              the components of the model one by one, as for a trace
+ *     component              the components of the model one by one
+ *
+ * Whatever is chosen, the components decode where a trace is armed, where a test bench has preset extrinsic
+ * values, and where it has put in components of its own or changed what they hold. (Of the correction table
+ * of algorithm type 2, entries of differences of 64 steps or more, where the hardware has no corrections,
+ * are not looked at: choose "component" to decode with others there.)
  *
  * @param state    a live state
  * @param name     one of these names
- * @return 0, or 1 after one line on the standard error stream when the name is another or the machine lacks it
+ * @return 0; 1 after one line on the standard error stream when the name is another or the machine lacks it;
+ *         99 after the line of the other calls when memory is exhausted, and nothing is changed
  */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_set_instruction_set(veltra_ip_morvik_v1_0_state* state, const char* name);
 
 /** Tells how a state computes.
  *
  * @param state    a live state
- * @return the name in use, one of those above
+ * @return the name in use, one of those above: "component" also while a component is not what create_state made
  */
 MORVIK_API const char* veltra_ip_morvik_v1_0_get_instruction_set(const veltra_ip_morvik_v1_0_state* state);
 

@@ -135,7 +135,8 @@ MORVIK_API void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state*
  * Soft values: fixed-point numbers with 8 bits, 3 of them fraction, so 8 steps to one and -128 to
  * 127 in all. A positive value favours bit 1, a negative one bit 0; the magnitude says how much.
  * Only the low 24 bits of a value are looked at, read as a two's complement number, and that
- * number is clipped to -128 to 127. (16777216 is therefore read as 0, without a warning.)
+ * number is clipped to -128 to 127. (16777216 is therefore read as 0, without a warning.) The arrays may
+ * begin at any address.
  *
  * Tail: the last four positions carry the twelve trellis termination values in the standard's
  * order (clause 5.1.3.2.2), x and z being systematic and parity bits of the first encoder, x' and
@@ -182,8 +183,9 @@ MORVIK_API void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state*
  * and "positively" or "negatively". A C_TAG_WIDTH of 32 keeps no bit of the tag, as 0 does: the
  * hardware forms the mask with a shift count of five bits.
  *
- * The buffer of soft values is built before the decoder is called; memory exhausted at that moment
- * leaves the function as a C++ exception, std::bad_alloc or std::length_error.
+ * Where the components decode (morvik_v1_0_batch.h tells when), a buffer of soft values is built before the
+ * decoder is called; memory exhausted at that moment leaves the function as a C++ exception, std::bad_alloc
+ * or std::length_error.
  */
 MORVIK_API int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state,
                                                          const int32_t* rsc1_sys,

@@ -24,7 +24,7 @@ struct BlockCut {
 /// Positions of a block that carry its tail, behind K others.
 constexpr unsigned tailPositions = 4;
 
-/// The caller's three streams of a block, K + 4 values each.
+/// The caller's three streams of a block, K + 4 values each, at any addresses.
 template <class Input>
 struct Streams {
     const Input* systematic;

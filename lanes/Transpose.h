@@ -83,8 +83,8 @@ template <unsigned lanes>
 using TileOfRows = Tile<1>;
 #endif
 
-/// Eight of the caller's values. Those beyond 16 bits, of which only the low 24 count (rule 4), come out as some
-/// others that are beyond the input format, too.
+/// Eight of the caller's values, at any address. Those beyond 16 bits, of which only the low 24 count (rule 4), come
+/// out as some others that are beyond the input format, too.
 template <class Input>
 MORVIK_INLINE Raw<8>::Signed inputWords(const Input* values)
 {
@@ -94,9 +94,11 @@ MORVIK_INLINE Raw<8>::Signed inputWords(const Input* values)
         const auto* const quads = reinterpret_cast<const __m128i*>(values);
         return (Words)_mm_packs_epi32(_mm_loadu_si128(quads), _mm_loadu_si128(quads + 1));
 #else
+        std::int32_t copies[8];
+        std::memcpy(copies, values, sizeof copies);
         Words words;
         for (unsigned i = 0; i < 8; ++i) {
-            words[i] = static_cast<std::int16_t>(values[i] < -32768 ? -32768 : values[i] > 32767 ? 32767 : values[i]);
+            words[i] = static_cast<std::int16_t>(copies[i] < -32768 ? -32768 : copies[i] > 32767 ? 32767 : copies[i]);
         }
         return words;
 #endif

@@ -8,25 +8,33 @@
 
 #include "../lanes/InstructionSets.h"
 #include "../lanes/LaneDecoder.h"
-#include "TCalculationEngine.h"
+#include "Components.h"
 #include "TDecoder3GPU.h"
-#include "TInterleaver.h"
 
 /// Decodes for a decoder whose metric columns nobody watches, and keeps its counters. The columns are not
 /// computed here, but a trace shows what earlier blocks left in some of them; before the components work
-/// again, catchUp therefore lets them decode the blocks whose columns would still be there.
+/// again, catchUp therefore computes those of the blocks whose columns would still be there.
 class LanePath {
 public:
-    /// The path for a decoder whose engine and interleaver are in place and are the interface's own.
-    LanePath(TDecoder3GPU& decoder, lanes::Algorithm algorithm, const lanes::InstructionSet& instructionSet);
+    using State = components::State;
+
+    /// The path for a state whose components have just been made.
+    LanePath(const State& state, const lanes::InstructionSet& instructionSet);
 
     const lanes::InstructionSet& instructionSet() const;
     void setInstructionSet(const lanes::InstructionSet& instructionSet);
 
-    /// Makes everything ready for blocks of K bits. Exhausted memory throws std::bad_alloc.
-    void prepare(unsigned K);
+    /// Whether the lanes decode a block of K bits as the state's components would, and nobody watches those; then
+    /// everything is ready for it. Exhausted memory throws std::bad_alloc.
+    bool takes(const State& state, unsigned K);
 
-    /// The lanes' own load, decode and results, after prepare.
+    /// Whether the state's components are those that were made with it.
+    bool knows(const State& state) const
+    {
+        return itsCreated.matches(state);
+    }
+
+    /// The lanes' own load, decode and results, after takes.
     unsigned blocksTaken(unsigned blocks) const;
 
     template <class Input>
@@ -53,8 +61,8 @@ public:
     void decisions(std::uint8_t* const* blocks);
     void ratios(std::int16_t* const* blocks);
 
-    /// Leaves the decoder's columns as they would be had it decoded everything itself.
-    void catchUp();
+    /// Leaves the columns of the state's decoder as they would be had it decoded everything itself.
+    void catchUp(const State& state);
 
 private:
     /// A decoded block whose columns would still be there: each later one is shorter.
@@ -64,11 +72,24 @@ private:
         unsigned iterations;
     };
 
+    struct Release {
+        void operator()(State* state) const;
+    };
+
+    void forgetBlocksOfOthers(const State& state);
+    void prepare(unsigned K);
+    void dropOtherTables(unsigned K);
+    bool keepsTheirTables(unsigned K);
     void count(unsigned iterations);
     void keepLast();
+    TDecoder3GPU& twin();
+    void computeColumns();
 
-    TDecoder3GPU& itsDecoder;
-    const lanes::Algorithm itsAlgorithm;
+    const components::Snapshot itsCreated;
+    const veltra_ip_morvik_v1_0_generics itsGenerics;
+    TDecoder3GPU& itsDecoder;  ///< may be used while the state still has it
+    const lanes::CorrectionTable itsCorrections;
+    std::unique_ptr<State, Release> itsTwin;  ///< components that nobody changes, once there was something to catch up
     std::unique_ptr<lanes::LaneDecoder> itsLanes;
     std::vector<Past> itsPast;
     unsigned itsLoaded = 0;      ///< blocks

@@ -3,6 +3,7 @@
 
 #include <array>
 
+#include "../lanes/Unaligned.h"
 #include "Arithmetic.h"
 #include "LanePath.h"
 #include "Messages.h"
@@ -54,7 +55,8 @@ void convert(State& state, const lanes::Streams<Input>& block, std::int32_t dinS
     for (std::int32_t i = 0; i < dinSize; ++i) {
         for (unsigned s = 0; s < streamCount; ++s) {
             std::int32_t excess = 0;
-            const std::int32_t kept = inputInteger(streams[s][i], *state.input_format, excess);
+            const std::int32_t value = lanes::valueAt(streams[s], static_cast<std::size_t>(i));
+            const std::int32_t kept = inputInteger(value, *state.input_format, excess);
             if (excess != 0) {
                 reportSaturation(state, s, i, excess > 0);
             }
@@ -72,15 +74,12 @@ Status withSoftValues(State& state, const lanes::Streams<Input>& streams, std::i
     convert(state, streams, dinSize, [&](unsigned, std::int32_t, std::int32_t kept) {
         soft.push_back(state.state_format->place(kept));
     });
-    try {
+    return guarded([&] {
         if (state.lane_path != nullptr) {
-            state.lane_path->catchUp();
+            state.lane_path->catchUp(state);
         }
         return decode(soft) ? success : decodeFailed;
-    } catch (...) {
-        refuse("Unhandled exception has occurred");
-        return exceptionRaised;
-    }
+    });
 }
 
 }  // namespace
@@ -128,16 +127,10 @@ Status countByComponents(State& state,
     });
 }
 
-/// Whether somebody traces or presets values that the lanes do not have.
-bool isWatched(const TDecoder& decoder)
-{
-    return decoder.itsDumpCount != 0 || decoder.itsTraceLevel != 0 || !decoder.itsExtrinsicIn.empty();
-}
-
 bool lanesTake(const State& state, std::int32_t dinSize)
 {
-    return state.lane_path != nullptr && !state.by_components && !isWatched(*state.decoder) &&
-           dinSize > std::int32_t{lanes::tailPositions} && state.interleaver->valid(blockSizeOf(dinSize));
+    return state.lane_path != nullptr && !state.by_components && dinSize > std::int32_t{lanes::tailPositions} &&
+           state.lane_path->takes(state, blockSizeOf(dinSize));
 }
 
 template <class Input>
@@ -145,7 +138,6 @@ unsigned loadLanes(
     State& state, const lanes::Streams<Input>* blocks, unsigned count, std::int32_t dinSize, const std::uint32_t* tags)
 {
     LanePath& path = *state.lane_path;
-    path.prepare(blockSizeOf(dinSize));
     const unsigned taken = path.blocksTaken(count);
     if (path.load(blocks, count)) {
         return taken;
@@ -160,7 +152,7 @@ unsigned loadLanes(
         });
         again.push_back({to, to + size, to + 2 * size});
         if (tags != nullptr) {
-            truncateTag(state, tags[b]);
+            truncateTag(state, lanes::valueAt(tags, b));
         }
     }
     path.load(again.data(), taken);

@@ -18,6 +18,18 @@ enum Status : std::int32_t { success = 0, refused = 1, decodeFailed = 2, excepti
 /// Writes the line of a refusal.
 Status refuse(const char* reason);
 
+/// Runs a part of a call that may throw: exhausted memory becomes the line and the status of an exception.
+template <class Part>
+auto guarded(Part part) -> decltype(part())
+{
+    try {
+        return part();
+    } catch (...) {
+        refuse("Unhandled exception has occurred");
+        return exceptionRaised;
+    }
+}
+
 /// What is wrong with the arguments of a call, or null; `outputFault` is what is wrong with where its results go.
 template <class Input>
 const char* checkArguments(const State* state,
@@ -64,7 +76,8 @@ const char* outputFault(const Outputs* outputs)
 std::uint32_t truncateTag(State& state, std::uint32_t tag);
 
 /// A block through the components: joins the three streams, position by position, into aligned soft
-/// values, reporting the first of a state's life that has to be clipped, and decodes them.
+/// values, reporting the first of a state's life that has to be clipped, and decodes them. Memory exhausted while
+/// they are joined leaves it as an exception.
 template <class Input>
 Status decodeByComponents(State& state,
                           const lanes::Streams<Input>& streams,
@@ -87,11 +100,12 @@ inline unsigned blockSizeOf(std::int32_t dinSize)
     return static_cast<unsigned>(dinSize) - lanes::tailPositions;
 }
 
-/// Whether the lanes decode a block of dinSize positions for this state: nobody watches its columns.
+/// Whether the lanes decode the state's next block, of dinSize positions, or the components have to. Exhausted memory
+/// throws std::bad_alloc.
 bool lanesTake(const State& state, std::int32_t dinSize);
 
 /// Takes as many of the blocks into the lanes as they like, with the same report; returns how many. Tags
-/// of the blocks before the reported one, when there are any, are reported before it.
+/// of the blocks before the reported one, when there are any, are reported before it. The lanes must take them.
 template <class Input>
 unsigned loadLanes(
     State& state, const lanes::Streams<Input>* blocks, unsigned count, std::int32_t dinSize, const std::uint32_t* tags);

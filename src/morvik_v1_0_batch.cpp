@@ -2,10 +2,12 @@
 #include "morvik_v1_0_batch.h"
 
 #include <algorithm>
+#include <cstring>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "../lanes/Unaligned.h"
 #include "LanePath.h"
 #include "Messages.h"
 #include "SimulationCall.h"
@@ -35,7 +37,7 @@ struct Batch {
 
     std::uint32_t tag(std::size_t b) const
     {
-        return tags == nullptr ? 0 : tags[b];
+        return tags == nullptr ? 0 : lanes::valueAt(tags, b);
     }
 };
 
@@ -59,7 +61,7 @@ void deliverTag(State& state, Outputs& outputs, std::size_t b, std::uint32_t tag
 {
     const std::uint32_t kept = truncateTag(state, tag);
     if (outputs.tags != nullptr) {
-        outputs.tags[b] = kept;
+        lanes::setValueAt(outputs.tags, b, kept);
     }
 }
 
@@ -78,7 +80,8 @@ Status runByComponents(State& state, const Batch<Input>& batch, Outputs& outputs
         }
         std::copy(hard.begin(), hard.end(), outputs.dout + b * hard.size());
         if (outputs.ratios != nullptr) {
-            std::copy_n(state.decoder->itsLLR.begin(), hard.size(), outputs.ratios + b * hard.size());
+            std::memcpy(
+                outputs.ratios + b * hard.size(), state.decoder->itsLLR.data(), hard.size() * sizeof *outputs.ratios);
         }
         deliverTag(state, outputs, b, batch.tag(b));
     }
@@ -132,8 +135,10 @@ std::int32_t simulate(State* state, const Batch<Input>& batch, Outputs* outputs)
     if (batch.blocks == 0) {
         return success;
     }
-    return lanesTake(*state, batch.dinSize) ? runByLanes(*state, batch, *outputs)
-                                            : runByComponents(*state, batch, *outputs);
+    return guarded([&] {
+        return lanesTake(*state, batch.dinSize) ? runByLanes(*state, batch, *outputs)
+                                                : runByComponents(*state, batch, *outputs);
+    });
 }
 
 /// What was sent, and where the counts of wrong decisions go.
@@ -166,9 +171,9 @@ Status countAllByComponents(State& state, const Batch<Input>& batch, const Error
         if (status != success) {
             return status;
         }
-        std::transform(bitErrors.begin(), bitErrors.end(), count.errors + b * batch.iterations, [](auto errors) {
-            return static_cast<std::uint32_t>(errors);
-        });
+        for (std::size_t t = 0; t < bitErrors.size(); ++t) {
+            lanes::setValueAt(count.errors, b * batch.iterations + t, static_cast<std::uint32_t>(bitErrors[t]));
+        }
     }
     return success;
 }
@@ -204,7 +209,8 @@ Status countAllByLanes(State& state, const Batch<Input>& batch, const ErrorCount
         path.decode(batch.iterations, [&](unsigned t) {
             path.decisions(decisions.data());
             for (std::size_t i = 0; i < taken; ++i) {
-                count.errors[(b + i) * batch.iterations + t] = differences(decisions[i], count.sent + (b + i) * K, K);
+                const std::uint32_t errors = differences(decisions[i], count.sent + (b + i) * K, K);
+                lanes::setValueAt(count.errors, (b + i) * batch.iterations + t, errors);
             }
         });
     }
@@ -221,8 +227,32 @@ std::int32_t countErrors(State* state, const Batch<Input>& batch, const ErrorCou
     if (batch.blocks == 0) {
         return success;
     }
-    return lanesTake(*state, batch.dinSize) ? countAllByLanes(*state, batch, count)
-                                            : countAllByComponents(*state, batch, count);
+    return guarded([&] {
+        return lanesTake(*state, batch.dinSize) ? countAllByLanes(*state, batch, count)
+                                                : countAllByComponents(*state, batch, count);
+    });
+}
+
+Status setInstructionSet(State& state, std::string_view wanted)
+{
+    std::string known;
+    for (const lanes::InstructionSet* set : lanes::availableInstructionSets()) {
+        if (state.lane_path == nullptr) {
+            break;
+        }
+        if (wanted == set->name) {
+            state.lane_path->setInstructionSet(*set);
+            state.by_components = false;
+            return success;
+        }
+        known += std::string(set->name) + ", ";
+    }
+    if (wanted == byComponents) {
+        state.by_components = true;
+        return success;
+    }
+    messages::writeError("ERROR:decoder:Instruction set '", wanted, "' is not one of ", known, byComponents);
+    return refused;
 }
 
 }  // namespace
@@ -316,25 +346,7 @@ int32_t veltra_ip_morvik_v1_0_set_instruction_set(veltra_ip_morvik_v1_0_state* s
     if (state == nullptr) {
         return refuse("set_instruction_set called with null state structure");
     }
-    const std::string_view wanted = name == nullptr ? "" : name;
-    std::string known;
-    for (const lanes::InstructionSet* set : lanes::availableInstructionSets()) {
-        if (state->lane_path == nullptr) {
-            break;
-        }
-        if (wanted == set->name) {
-            state->lane_path->setInstructionSet(*set);
-            state->by_components = false;
-            return success;
-        }
-        known += std::string(set->name) + ", ";
-    }
-    if (wanted == byComponents) {
-        state->by_components = true;
-        return success;
-    }
-    messages::writeError("ERROR:decoder:Instruction set '", wanted, "' is not one of ", known, byComponents);
-    return refused;
+    return guarded([&] { return setInstructionSet(*state, name == nullptr ? "" : name); });
 }
 
 const char* veltra_ip_morvik_v1_0_get_instruction_set(const veltra_ip_morvik_v1_0_state* state)
@@ -343,5 +355,6 @@ const char* veltra_ip_morvik_v1_0_get_instruction_set(const veltra_ip_morvik_v1_
         refuse("get_instruction_set called with null state structure");
         return nullptr;
     }
-    return state->lane_path == nullptr || state->by_components ? byComponents : state->lane_path->instructionSet().name;
+    const bool byLanes = state->lane_path != nullptr && !state->by_components && state->lane_path->knows(*state);
+    return byLanes ? state->lane_path->instructionSet().name : byComponents;
 }

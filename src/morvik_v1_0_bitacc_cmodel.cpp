@@ -4,9 +4,10 @@
 #include <algorithm>
 #include <cstddef>
 #include <cstdlib>
-#include <string>
+#include <optional>
 #include <vector>
 
+#include "Components.h"
 #include "DecoderState.h"
 #include "LanePath.h"
 #include "Messages.h"
@@ -17,6 +18,8 @@ namespace {
 using Generics = veltra_ip_morvik_v1_0_generics;
 using namespace simulation_call;
 using Outputs = veltra_ip_morvik_v1_0_outputs;
+
+constexpr const char* noRoom = "Insufficient allocated space for output array";
 
 /// What is wrong with the generics, or null.
 const char* checkGenerics(const Generics& generics)
@@ -45,61 +48,57 @@ const char* checkGenerics(const Generics& generics)
     return nullptr;
 }
 
-TNumberFormat* createFormat(int integerBits, int fractionBits)
+/// Builds what a state consists of; null, or what failed.
+const char* build(State& state)
 {
-    return TNumberFormat::create("Fix_" + std::to_string(integerBits + fractionBits) + "_" +
-                                 std::to_string(fractionBits));
-}
-
-/// Builds the components of a state from its generics; null, or what failed.
-const char* buildComponents(State& state)
-{
-    const Generics& generics = state.generics;
-    state.state_format = createFormat(generics.C_STATE_INT_WIDTH, generics.C_STATE_FRAC_WIDTH);
-    if (state.state_format == nullptr) {
-        return "Could not set state number format";
+    if (const char* reason = components::create(state)) {
+        return reason;
     }
-    state.branch_format = TNumberFormat::create("Fix_8_3");
-    if (state.branch_format == nullptr) {
-        return "Could not set branch number format";
-    }
-    state.input_format = createFormat(generics.C_INPUT_INT_WIDTH, generics.C_INPUT_FRAC_WIDTH);
-    if (state.input_format == nullptr) {
-        return "Could not set input number format";
-    }
-    state.interleaver = TInterleaver::create("3GPPLTE");
-    if (state.interleaver == nullptr) {
-        return "Could not create interleaver";
-    }
-    state.engine = TCalculationEngine::create(generics.C_ALGORITHM_TYPE == 2 ? "MOD#:16" : "MOD");
-    if (state.engine == nullptr) {
-        return "Could not create calculation engine";
-    }
-    state.engine->itsInputFormat = state.input_format;
-    state.engine->itsStateFormat = state.state_format;
-    state.engine->itsBranchFormat = state.branch_format;
-    if (!state.engine->initialise()) {
-        return "Could not initialise calculation engine";
-    }
-    state.decoder = TDecoder::create("3GPPPU:" + std::to_string(generics.C_NUM_PU));
-    if (state.decoder == nullptr) {
-        return "Could not create decoder";
-    }
-    state.decoder->itsInterleaver = state.interleaver;
-    state.decoder->itsEngine = state.engine;
-    state.decoder->itsExtrinsicScale = generics.C_ALGORITHM_TYPE == 1 ? 0.75 : 1.0;
-    state.lane_path = new LanePath(static_cast<TDecoder3GPU&>(*state.decoder),
-                                   static_cast<lanes::Algorithm>(generics.C_ALGORITHM_TYPE),
-                                   lanes::bestInstructionSet());
+    state.lane_path = new LanePath(state, lanes::bestInstructionSet());
     return nullptr;
 }
 
-/// Releases a component and forgets it.
-template <class Component>
-void release(Component*& component)
+/// What one block is decoded with, and where its results go.
+struct Call {
+    lanes::Streams<std::int32_t> streams;
+    std::int32_t dinSize;
+    std::uint32_t iterations;
+    std::uint32_t tag;
+    Outputs& outputs;
+};
+
+/// Delivers all but the decisions.
+Status delivered(State& state, const Call& call, std::size_t K)
 {
-    delete component;
-    component = nullptr;
+    call.outputs.dout_size = static_cast<std::uint32_t>(K);
+    call.outputs.tag = truncateTag(state, call.tag);
+    return success;
+}
+
+Status simulateByLanes(State& state, const Call& call)
+{
+    const std::size_t K = blockSizeOf(call.dinSize);
+    loadLanes(state, &call.streams, 1, call.dinSize, nullptr);
+    state.lane_path->decode(call.iterations);
+    if (call.outputs.dout_alloc < K) {
+        return refuse(noRoom);
+    }
+    state.lane_path->decisions(&call.outputs.dout);
+    return delivered(state, call, K);
+}
+
+Status simulateByComponents(State& state, const Call& call)
+{
+    std::vector<unsigned char> hard;
+    const Status status = decodeByComponents(state, call.streams, call.dinSize, call.iterations, hard);
+    if (status != success) {
+        return status;
+    }
+    if (call.outputs.dout_alloc < hard.size()) {
+        return refuse(noRoom);
+    }
+    std::copy(hard.begin(), hard.end(), call.outputs.dout);
+    return delivered(state, call, hard.size());
 }
 
 }  // namespace
@@ -147,7 +146,7 @@ veltra_ip_morvik_v1_0_state* veltra_ip_morvik_v1_0_create_state(veltra_ip_morvik
     }
     const char* reason = nullptr;
     try {
-        reason = buildComponents(*state);
+        reason = build(*state);
     } catch (...) {
         reason = "Unhandled exception has occurred";
     }
@@ -164,13 +163,8 @@ void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state* state)
     if (state == nullptr) {
         return;
     }
-    release(state->lane_path);
-    release(state->state_format);
-    release(state->branch_format);
-    release(state->input_format);
-    release(state->engine);
-    release(state->interleaver);
-    release(state->decoder);
+    delete state->lane_path;
+    components::release(*state);
     std::free(state);
 }
 
@@ -193,29 +187,9 @@ int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state
     if (const char* reason = checkArguments(state, outputFault(outputs), streams, din_size, iterations)) {
         return refuse(reason);
     }
-    const bool byLanes = lanesTake(*state, din_size);
-    std::vector<unsigned char> hard;
-    std::size_t K = 0;
-    if (byLanes) {
-        K = blockSizeOf(din_size);
-        loadLanes<std::int32_t>(*state, &streams, 1, din_size, nullptr);
-        state->lane_path->decode(iterations);
-    } else {
-        const Status status = decodeByComponents(*state, streams, din_size, iterations, hard);
-        if (status != success) {
-            return status;
-        }
-        K = hard.size();
-    }
-    if (outputs->dout_alloc < K) {
-        return refuse("Insufficient allocated space for output array");
-    }
-    if (byLanes) {
-        state->lane_path->decisions(&outputs->dout);
-    } else {
-        std::copy(hard.begin(), hard.end(), outputs->dout);
-    }
-    outputs->dout_size = static_cast<std::uint32_t>(K);
-    outputs->tag = truncateTag(*state, tag);
-    return success;
+    const Call call = {streams, din_size, iterations, tag, *outputs};
+    const auto taken = guarded([&]() -> std::optional<Status> {
+        return lanesTake(*state, din_size) ? std::optional<Status>(simulateByLanes(*state, call)) : std::nullopt;
+    });
+    return taken ? *taken : simulateByComponents(*state, call);
 }

@@ -3,6 +3,7 @@
 
 #include <mutex>
 #include <sstream>
+#include <utility>
 
 #include "bindings/Listener.h"
 #include "standard/BlockSizes.h"
@@ -63,40 +64,41 @@ void Session::put(int sys, int par1, int par2) noexcept
 int Session::decode(int iterations, std::uint32_t tag)
 {
     itsBits.clear();
+    const std::size_t positions = std::exchange(itsPositions, 0U);  // forgotten however the call ends
     int status = 1;
     if (!open()) {
         itsMessages.emplace_back("ERROR:binding:The generics of this decoder were refused, so it does not decode");
-    } else if (itsPositions == 0) {
+    } else if (positions == 0) {
         itsMessages.emplace_back(
             "ERROR:binding:The streams are empty, but a block of K bits has K + 4 soft values in each");
-    } else if (itsPositions > mostPositions) {
-        itsMessages.push_back("ERROR:binding:Block size not supported" + sizeHint(itsPositions));
+    } else if (positions > mostPositions) {
+        itsMessages.push_back("ERROR:binding:Block size not supported" + sizeHint(positions));
     } else {
-        status = simulate(iterations, tag);
+        status = simulate(positions, iterations, tag);
     }
-    itsPositions = 0;
     return status;
 }
 
-int Session::simulate(int iterations, std::uint32_t tag)
+/// What it delivers is taken over last, so that exhausted memory leaves none of it.
+int Session::simulate(std::size_t positions, int iterations, std::uint32_t tag)
 {
-    itsBits.resize(mostPositions);
-    veltra_ip_morvik_v1_0_outputs outputs{itsBits.data(), static_cast<std::uint32_t>(itsBits.size()), 0, itsTag};
+    std::array<std::uint8_t, mostPositions> bits;
+    veltra_ip_morvik_v1_0_outputs outputs{bits.data(), static_cast<std::uint32_t>(bits.size()), 0, itsTag};
     const std::lock_guard<std::mutex> lock(turn);
     const Listener listener;
     const int status = veltra_ip_morvik_v1_0_bitacc_simulate(itsState,
                                                              itsStreams[0].data(),
                                                              itsStreams[1].data(),
                                                              itsStreams[2].data(),
-                                                             static_cast<std::int32_t>(itsPositions),
+                                                             static_cast<std::int32_t>(positions),
                                                              static_cast<std::uint32_t>(iterations),
                                                              tag,
                                                              &outputs);
     queue(listener.text());
-    if (status == 2) {
-        itsMessages.back() += sizeHint(itsPositions);
+    if (status == 2 && !itsMessages.empty()) {
+        itsMessages.back() += sizeHint(positions);
     }
-    itsBits.resize(outputs.dout_size);
+    itsBits.assign(bits.begin(), bits.begin() + outputs.dout_size);
     itsTag = outputs.tag;
     return status;
 }

@@ -33,7 +33,7 @@ public:
     void put(int sys, int par1, int par2) noexcept;
 
     /// Decodes the positions that were put since the last call, K + 4, and forgets them. Returns the status of the C
-    /// interface, 0 when decoded.
+    /// interface, 0 when decoded. Memory exhausted outside of it throws std::bad_alloc.
     int decode(int iterations, std::uint32_t tag);
 
     /// The decisions of the last decode, none when it was refused.
@@ -52,7 +52,7 @@ public:
     const std::string& nextMessage();
 
 private:
-    int simulate(int iterations, std::uint32_t tag);
+    int simulate(std::size_t positions, int iterations, std::uint32_t tag);
     void queue(const std::string& lines);
 
     veltra_ip_morvik_v1_0_state* itsState = nullptr;

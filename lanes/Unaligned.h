@@ -1,0 +1,26 @@
+// Unaligned: elements of the caller's arrays, which may begin at any address.
+#ifndef MORVIK_LANES_UNALIGNED_H
+#define MORVIK_LANES_UNALIGNED_H
+
+#include <cstddef>
+#include <cstring>
+
+namespace lanes {
+
+template <class Value>
+Value valueAt(const Value* array, std::size_t i)
+{
+    Value value;
+    std::memcpy(&value, array + i, sizeof value);
+    return value;
+}
+
+template <class Value>
+void setValueAt(Value* array, std::size_t i, Value value)
+{
+    std::memcpy(array + i, &value, sizeof value);
+}
+
+}  // namespace lanes
+
+#endif
