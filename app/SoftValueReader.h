@@ -34,6 +34,12 @@ public:
     /// so that the block itself is not lost: only if that row has a label can one tell that it belongs to another.
     bool next(SoftBlock& block);
 
+    /// Whether anything but blank lines follows the block just read.
+    bool hasMore() const
+    {
+        return !itsAtEnd || itsMistake;
+    }
+
     /// Throws a FileError about the first line of the block just read, or about the mistake that cut it short.
     [[noreturn]] void failBlock(const std::string& what) const;
 

@@ -78,6 +78,12 @@ std::string blocksAndFormats(const vectors::Manifest& manifest)
     return std::to_string(count) + (count == 1 ? " block in " : " blocks in ") + listed(manifest.formats, name);
 }
 
+std::string comparedText(const vectors::Compared& compared)
+{
+    return std::to_string(compared.tags) + " tags, " + std::to_string(compared.decisions) + " decisions, " +
+           std::to_string(compared.ratios) + " ratios, " + std::to_string(compared.internal) + " internal values";
+}
+
 int make(const Options& options)
 {
     vectors::Manifest manifest;
@@ -100,7 +106,8 @@ int check(const std::string& folder)
         print(folder + ": " + *set.difference);
         return differencesFound;
     }
-    print(folder + ": " + blocksAndFormats(set.manifest) + ", all as the model decodes them");
+    print(folder + ": " + blocksAndFormats(set.manifest) +
+          ", all as the model decodes them: " + comparedText(set.compared));
     return success;
 }
 

@@ -147,7 +147,7 @@ void BlockWriter::addRow(std::size_t table, const Row& row)
 }
 
 BlockReader::BlockReader(const std::string& folder, const Format& format, const Settings& settings)
-    : itsLayout(format, settings), itsIterations(settings.iterations)
+    : itsLayout(format, settings), itsIterations(settings.iterations), itsRows(itsLayout.tables.size())
 {
     for (const Table& table : itsLayout.tables) {
         itsReaders.push_back(format.reader(folder, table));
@@ -156,11 +156,14 @@ BlockReader::BlockReader(const std::string& folder, const Format& format, const 
 
 bool BlockReader::next(Stimulus& stimulus, Expected& expected)
 {
-    if (!itsReaders[itsLayout.blocks]->next(itsRow)) {
+    ++itsBlock;
+    if (!nextRow(itsLayout.blocks)) {
         expectEnd();
         return false;
     }
     checkBlock(itsRow, itsIterations, itsReaders[itsLayout.blocks]->place());
+    expectFirst(4, itsLayout.stimulus);
+    expectFirst(5, itsLayout.expected);
     stimulus = Stimulus{};
     stimulus.K = static_cast<std::uint32_t>(itsRow[0]);
     stimulus.tag = static_cast<std::uint32_t>(itsRow[2]);
@@ -174,9 +177,34 @@ bool BlockReader::next(Stimulus& stimulus, Expected& expected)
     return true;
 }
 
+/// Goes to the next row of a table, which has to belong to the block.
+bool BlockReader::nextRow(std::size_t table)
+{
+    const TableReader& reader = *itsReaders[table];
+    if (!itsReaders[table]->next(itsRow)) {
+        return false;
+    }
+    if (reader.block().value_or(itsBlock) != itsBlock) {
+        throw simulation::Error(reader.place() + ": block " + std::to_string(*reader.block()) +
+                                ", expected a row of block " + std::to_string(itsBlock));
+    }
+    ++itsRows[table];
+    return true;
+}
+
+/// A column of the table of blocks has to tell where the block begins in another table.
+void BlockReader::expectFirst(std::size_t column, std::size_t table) const
+{
+    if (static_cast<std::uint64_t>(itsRow[column]) != itsRows[table]) {
+        throw simulation::Error(itsReaders[itsLayout.blocks]->place() + ": " + blocksTable().columns[column].name +
+                                ' ' + std::to_string(itsRow[column]) + ", the block begins at " +
+                                std::to_string(itsRows[table]));
+    }
+}
+
 void BlockReader::readRow(std::size_t table)
 {
-    if (!itsReaders[table]->next(itsRow)) {
+    if (!nextRow(table)) {
         throw simulation::Error(itsReaders[table]->place() + ": the rows of " + itsLayout.tables[table].name +
                                 " end too early for the blocks");
     }

@@ -68,8 +68,16 @@ public:
     /// Goes to the next block; false at the end, where no table may have rows left. Names are not in the tables.
     bool next(Stimulus& stimulus, Expected& expected);
 
+    /// The rows that have been read of each table.
+    const std::vector<std::uint64_t>& rows() const
+    {
+        return itsRows;
+    }
+
 private:
+    bool nextRow(std::size_t table);
     void readRow(std::size_t table);
+    void expectFirst(std::size_t column, std::size_t table) const;
     void readStimulus(Stimulus& stimulus);
     void readExpected(Expected& expected, std::uint32_t K);
     void readInternal(Expected& expected, std::uint32_t K);
@@ -78,6 +86,8 @@ private:
     Layout itsLayout;
     std::uint32_t itsIterations;
     std::vector<std::unique_ptr<TableReader>> itsReaders;
+    std::vector<std::uint64_t> itsRows;
+    std::int64_t itsBlock = -1;
     Row itsRow;
 };
 

@@ -177,7 +177,7 @@ void forEachStimulus(const Settings& settings, const std::function<void(const St
     Source source(settings, take);
     for (const unsigned K : settings.blockSizes) {
         for (unsigned frame = 0; frame < settings.blocks; ++frame) {
-            source.takeRandom("random", K, frame);
+            source.takeRandom(randomName, K, frame);
         }
     }
     if (settings.directed) {

@@ -11,6 +11,9 @@
 
 namespace morvik::vectors {
 
+/// The name of random blocks.
+constexpr char randomName[] = "random";
+
 /// Hands each stimulus on, one after the other: the random blocks of each size, then the directed ones.
 void forEachStimulus(const Settings& settings, const std::function<void(const Stimulus&)>& take);
 

@@ -67,7 +67,8 @@ public:
             return false;
         }
         std::string_view rest = itsFile.line();
-        bool isRow = takeInteger(rest).has_value();
+        itsBlock = takeInteger(rest);
+        bool isRow = itsBlock.has_value();
         row.resize(itsTable.columns.size());
         for (std::size_t i = 0; isRow && i < row.size(); ++i) {
             const auto value = take(rest, ",") ? takeInteger(rest) : std::nullopt;
@@ -82,6 +83,11 @@ public:
         return true;
     }
 
+    std::optional<std::int64_t> block() const override
+    {
+        return itsBlock;
+    }
+
     std::string place() const override
     {
         return itsFile.place();
@@ -90,6 +96,7 @@ public:
 private:
     Table itsTable;
     LineFile itsFile;
+    std::optional<std::int64_t> itsBlock;
 };
 
 }  // namespace

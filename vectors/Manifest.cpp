@@ -90,10 +90,32 @@ Settings settingsOf(const Json& json)
     if (settings.width % 8 != 0) {
         throw simulation::Error("width " + std::to_string(settings.width) + " is not allowed");
     }
+    settings.blockSizes = json.at("block_sizes").get<std::vector<unsigned>>();
+    settings.blocks = word(json, "blocks");
+    settings.directed = json.at("directed").get<bool>();
     settings.separateStreams = json.at("separate_streams").get<bool>();
     settings.ratios = json.at("soft").get<bool>();
     settings.internal = json.at("internal").get<bool>();
     return settings;
+}
+
+/// The tables of a format, which have to be those that it writes, but for their rows.
+std::vector<KeptTable> tablesFrom(const Json& json, const std::string& format, const std::vector<Table>& tables)
+{
+    std::vector<KeptTable> found;
+    for (const Table& table : tables) {
+        const std::size_t i = found.size();
+        const std::uint64_t rows = i < json.size() ? json.at(i).at("rows").get<std::uint64_t>() : 0;
+        found.push_back({table, rows});
+        if (i >= json.size() || nlohmann::json(json.at(i)) != nlohmann::json(tableOf(found.back()))) {
+            throw simulation::Error("format " + format + " lacks the table " + table.name +
+                                    " as its parameters make it");
+        }
+    }
+    if (json.size() > found.size()) {
+        throw simulation::Error("format " + format + " has more tables than its parameters make");
+    }
+    return found;
 }
 
 /// The format with its files, which have to be those that it writes with these settings.
@@ -109,7 +131,8 @@ ManifestFormat formatFrom(const Json& json, const Settings& settings)
         found.files.push_back({file.at("name").get<std::string>(), file.at("sha256").get<std::string>()});
     }
     std::size_t next = 0;
-    for (const Table& table : Layout(*format, settings).tables) {
+    const std::vector<Table> tables = Layout(*format, settings).tables;
+    for (const Table& table : tables) {
         for (const std::string& name : format->files(table)) {
             if (next == found.files.size() || found.files[next].name != name) {
                 throw simulation::Error("format " + found.name + " lacks the file " + name);
@@ -120,6 +143,7 @@ ManifestFormat formatFrom(const Json& json, const Settings& settings)
     if (next < found.files.size()) {
         throw simulation::Error("format " + found.name + " has no file " + simulation::shown(found.files[next].name));
     }
+    found.tables = tablesFrom(json.at("tables"), found.name, tables);
     return found;
 }
 
@@ -140,6 +164,9 @@ Manifest manifestFrom(const Json& json)
     }
     if (manifest.formats.empty()) {
         throw simulation::Error("names no format");
+    }
+    if (manifest.blocks.empty()) {
+        throw simulation::Error("names no block");
     }
     return manifest;
 }

@@ -42,8 +42,8 @@ constexpr char manifestName[] = "manifest.json";
 
 std::string manifestText(const Manifest& manifest);
 
-/// Reads what a set is checked by: all but the tables of the formats, which follow from the settings. Throws a
-/// simulation::Error that opens with the file when the text is no such manifest.
+/// Reads what a set is checked by. Throws a simulation::Error that opens with the file when the text is no such
+/// manifest, or names no block, no format, or other tables than the settings make.
 Manifest parseManifest(const std::string& text, const std::string& fileName);
 
 }  // namespace morvik::vectors

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <set>
 #include <system_error>
 
 #include "Blocks.h"
@@ -110,10 +111,86 @@ bool isNamed(const Stimulus& stimulus, const Expected& expected, const ManifestB
     return stimulus.K == named.K && stimulus.tag == named.tag && expected.tag == named.expectedTag;
 }
 
+void count(Compared& compared, const Expected& expected)
+{
+    ++compared.tags;
+    compared.decisions += expected.bits.size();
+    compared.ratios += expected.ratios.size();
+    compared.internal += std::uint64_t{expected.internal.size()} * passSignals.size();
+}
+
+void expectRows(const std::string& folder, const ManifestFormat& format, const std::vector<std::uint64_t>& rows)
+{
+    for (std::size_t i = 0; i < rows.size(); ++i) {
+        if (format.tables[i].rows != rows[i]) {
+            throw simulation::Error(manifestIn(folder) + ": tells " + std::to_string(format.tables[i].rows) +
+                                    " rows of " + format.tables[i].table.name + " in " + format.name + ", there are " +
+                                    std::to_string(rows[i]));
+        }
+    }
+}
+
+/// The blocks have to be as many as the parameters tell.
+void expectBlocks(const std::string& folder, const Manifest& manifest)
+{
+    const Settings& settings = manifest.settings;
+    const auto random = static_cast<std::uint64_t>(
+        std::count_if(manifest.blocks.begin(), manifest.blocks.end(), [](const ManifestBlock& block) {
+            return block.name == randomName;
+        }));
+    const std::uint64_t expected = std::uint64_t{settings.blocks} * settings.blockSizes.size();
+    if (random != expected) {
+        throw simulation::Error(manifestIn(folder) + ": names " + std::to_string(random) +
+                                " random blocks, its parameters make " + std::to_string(expected));
+    }
+    if (settings.directed != (random < manifest.blocks.size())) {
+        throw simulation::Error(manifestIn(folder) + ": names " +
+                                (settings.directed ? "no directed block" : "directed blocks") +
+                                ", its parameters make " + (settings.directed ? "some" : "none"));
+    }
+}
+
+/// The files of all tables that a set can have.
+std::set<std::string> filesOfAllTables()
+{
+    std::set<std::string> names;
+    Settings settings;
+    settings.ratios = true;
+    settings.internal = true;
+    for (const bool separate : {false, true}) {
+        settings.separateStreams = separate;
+        for (const Format& format : formats()) {
+            for (const Table& table : Layout(format, settings).tables) {
+                const std::vector<std::string> files = format.files(table);
+                names.insert(files.begin(), files.end());
+            }
+        }
+    }
+    return names;
+}
+
+/// The file of a table that the manifest does not name would be taken for one that was checked.
+void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
+{
+    std::set<std::string> others = filesOfAllTables();
+    for (const ManifestFormat& format : manifest.formats) {
+        for (const ManifestFile& file : format.files) {
+            others.erase(file.name);
+        }
+    }
+    for (const std::string& name : others) {
+        if (fs::exists(pathOf(folder, name))) {
+            throw simulation::Error(pathOf(folder, name) + ": is none of the files that " + manifestName +
+                                    " names, and cannot be checked");
+        }
+    }
+}
+
 /// Checks one format; the first difference.
 std::optional<std::string> checkFormat(const std::string& folder,
                                        const Manifest& manifest,
-                                       const ManifestFormat& format)
+                                       const ManifestFormat& format,
+                                       Compared& compared)
 {
     for (const ManifestFile& file : format.files) {
         const std::string path = pathOf(folder, file.name);
@@ -138,10 +215,12 @@ std::optional<std::string> checkFormat(const std::string& folder,
             throw simulation::Error(manifestIn(folder) + ": has another size or tag of block " +
                                     std::to_string(number) + " than " + format.name);
         }
+        count(compared, expected);
     }
     if (number < manifest.blocks.size()) {
         throw simulation::Error(manifestIn(folder) + ": names more blocks than " + format.name + " has");
     }
+    expectRows(folder, format, reader.rows());
     return std::nullopt;
 }
 
@@ -181,11 +260,13 @@ CheckedSet checkSet(const std::string& folder)
     CheckedSet checked;
     checked.manifest = parseManifest(simulation::readText(manifestIn(folder)), manifestIn(folder));
     for (const ManifestFormat& format : checked.manifest.formats) {
-        checked.difference = checkFormat(folder, checked.manifest, format);
+        checked.difference = checkFormat(folder, checked.manifest, format, checked.compared);
         if (checked.difference) {
-            break;
+            return checked;
         }
     }
+    expectBlocks(folder, checked.manifest);
+    expectNoOtherTable(folder, checked.manifest);
     return checked;
 }
 

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -42,6 +43,12 @@ public:
 
     /// Goes to the next row; false at the end.
     virtual bool next(Row& row) = 0;
+
+    /// The block to which the row belongs, where the format tells.
+    virtual std::optional<std::int64_t> block() const
+    {
+        return std::nullopt;
+    }
 
     /// The place of the row, for messages: FILE:LINE or FILE: row N.
     virtual std::string place() const = 0;

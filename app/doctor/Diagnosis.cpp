@@ -17,6 +17,10 @@ constexpr double enoughByItself = 12;
 constexpr double enoughWithDecoding = 6;
 /// Standard deviations by which signs have to be better than chance to belong to the bits.
 constexpr double related = 5;
+
+/// Blocks of which even fewer agree prove nothing where they decode: soft values of 0 decode into ones. Where a block
+/// of 40 bits just decodes, its signs are certain by some 6 standard deviations.
+constexpr double meaningful = 3;
 constexpr std::size_t likelyAttempts = 8;
 constexpr std::uint32_t simulatedBlocks = 400;
 /// Of the simulated blocks: when fewer fail, noise does not explain a failure.
@@ -224,7 +228,9 @@ private:
     void judge(const Attempt& asIs, Diagnosis& diagnosis)
     {
         const bool isMistaken = diagnosis.best.mistakes.count() > 0;
-        if (asIs.decoded == diagnosis.blocks) {
+        if (diagnosis.appearance.all().certainty() < meaningful) {
+            diagnosis.verdict = Verdict::unrelated;
+        } else if (asIs.decoded == diagnosis.blocks) {
             diagnosis.verdict = isMistaken ? Verdict::careless : Verdict::healthy;
         } else if (diagnosis.best.decoded == diagnosis.blocks) {
             diagnosis.verdict = Verdict::mistaken;

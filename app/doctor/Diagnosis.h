@@ -37,12 +37,13 @@ enum class Verdict {
     strange,      ///< blocks fail, and one stream has nothing to do with the bits while the others have
     noisy,        ///< blocks fail, once the mistakes (if any) are undone, as others do in this noise
     unexplained,  ///< the same, but others do not fail in this noise
-    unrelated,    ///< the soft values have nothing to do with the bits
+    unrelated,    ///< the soft values have nothing to do with the bits, decoded or not
 };
 
 struct Diagnosis {
     Verdict verdict = Verdict::healthy;
     std::size_t blocks = 0;
+    bool hasMore = false;                 ///< the file has blocks that were not looked at
     std::vector<Attempt> attempts;        ///< as the blocks are, then each mistake by itself and the most likely
                                           ///< combinations, the best first
     Attempt best;                         ///< with the mistakes that were found

@@ -207,6 +207,11 @@ std::string textOf(const Diagnosis& diagnosis)
     if (!diagnosis.hasNegative) {
         text += "No value is negative, as half of them should be: these are hard bits, or were taken for unsigned.\n";
     }
+    if (diagnosis.hasMore) {
+        text += "Looked at the first " +
+                (diagnosis.blocks == 1 ? "block" : std::to_string(diagnosis.blocks) + " blocks") +
+                " alone: the file has more, --blocks N takes them.\n";
+    }
     return text;
 }
 
@@ -216,6 +221,7 @@ std::string jsonOf(const Diagnosis& diagnosis)
     nlohmann::ordered_json object = {
         {"verdict", nameOf(diagnosis.verdict)},
         {"blocks", diagnosis.blocks},
+        {"more_blocks", diagnosis.hasMore},
         {"decoded", diagnosis.best.decoded},
         {"mistakes", mistakesOf(diagnosis.verdict == Verdict::unrelated ? Mistakes{} : diagnosis.best.mistakes)},
         {"wrong_signs",

@@ -42,7 +42,13 @@ void check(const doctor::Case& read, const SoftValueReader& blocks, const Refere
     }
 }
 
-std::vector<doctor::Case> readCases(const Options& options)
+/// The cases to look at.
+struct Cases {
+    std::vector<doctor::Case> cases;
+    bool hasMore = false;  ///< the file has more blocks
+};
+
+Cases readCases(const Options& options)
 {
     InputFile input(options.input);
     InputFile referenceFile(options.reference);
@@ -56,13 +62,17 @@ std::vector<doctor::Case> readCases(const Options& options)
         check(read, blocks, reference);
         cases.push_back(std::move(read));
     }
-    return cases;
+    if (!blocks.hasMore()) {
+        reference.expectEnd();
+    }
+    return {std::move(cases), blocks.hasMore()};
 }
 
 int examine(const Options& options)
 {
-    const std::vector<doctor::Case> cases = readCases(options);
-    const doctor::Diagnosis diagnosis = doctor::diagnose(cases, options.decoder);
+    const Cases read = readCases(options);
+    doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
+    diagnosis.hasMore = read.hasMore;
     std::cout << (options.json ? jsonOf(diagnosis) : textOf(diagnosis)) << std::flush;
     if (!std::cout) {
         throw FileError("<stdout>", cannotBe("written"));

@@ -55,6 +55,7 @@ struct Difference {
 struct Outcome {
     std::string instructionSet;
     bool available = false;
+    std::size_t configurations = 0;  ///< that were decoded
     std::vector<Difference> differences;
     double seconds = 0;
 };
@@ -68,6 +69,14 @@ struct Findings {
     bool blocksRight = false;
     std::vector<Outcome> outcomes;  ///< of each instruction set, the component path last
 
+    /// Whether the machine has to have the instruction set of an outcome: the one in use and those that every machine
+    /// has.
+    bool needs(const Outcome& outcome) const;
+
+    /// The configurations that were decoded, by all instruction sets.
+    std::size_t configurations() const;
+
+    /// Whether everything that has to be there has been decoded, in all configurations, and nothing differs.
     bool right() const;
 };
 

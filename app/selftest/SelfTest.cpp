@@ -21,20 +21,24 @@ struct Options {
     bool json = false;
 };
 
-std::string textOf(const Outcome& outcome)
+std::string textOf(const Outcome& outcome, bool isNeeded)
 {
     const std::size_t all = promise.configurations.size();
     char line[120];
     if (!outcome.available) {
-        std::snprintf(line, sizeof line, "  %-10s  not on this machine\n", outcome.instructionSet.c_str());
+        std::snprintf(line,
+                      sizeof line,
+                      "  %-10s  %s\n",
+                      outcome.instructionSet.c_str(),
+                      isNeeded ? "MISSING, was not checked" : "not on this machine");
         return line;
     }
     std::snprintf(line,
                   sizeof line,
                   "  %-10s  %s  %zu of %zu configurations  %6.2f s\n",
                   outcome.instructionSet.c_str(),
-                  outcome.differences.empty() ? "right" : "WRONG",
-                  all - outcome.differences.size(),
+                  outcome.differences.empty() && outcome.configurations == all ? "right" : "WRONG",
+                  outcome.configurations - outcome.differences.size(),
                   all,
                   outcome.seconds);
     std::string text = line;
@@ -52,8 +56,11 @@ std::string textOf(const Findings& findings)
                        " bits, all 188 sizes: " + (findings.blocksRight ? "right" : "WRONG") + " (digest " +
                        hexadecimal(findings.blockDigest) + ")\nIn use: " + findings.inUse + '\n';
     for (const Outcome& outcome : findings.outcomes) {
-        text += textOf(outcome);
+        text += textOf(outcome, findings.needs(outcome));
     }
+    const std::string decided = std::to_string(findings.bits * findings.configurations());
+    text += "Checked: " + decided + " decisions and " + decided + " ratios in " +
+            std::to_string(findings.configurations()) + " configurations\n";
     return text + (findings.right() ? "Passed: this machine gives the promised bits.\n"
                                     : "FAILED: this machine does not give the promised bits.\n");
 }
@@ -69,6 +76,7 @@ nlohmann::ordered_json jsonOf(const Outcome& outcome)
     }
     return {{"instruction_set", outcome.instructionSet},
             {"available", outcome.available},
+            {"configurations", outcome.configurations},
             {"differences", differences},
             {"seconds", outcome.seconds}};
 }

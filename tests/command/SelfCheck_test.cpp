@@ -127,6 +127,32 @@ TEST(SelfCheck, NoticesOtherBlocks)
     EXPECT_FALSE(findings.right());
 }
 
+TEST(SelfCheck, FailsWhereNothingIsDecoded)
+{
+    const Findings findings = check(promise, [](int, int, const std::string&) { return Decode(); });
+    EXPECT_TRUE(findings.blocksRight);
+    EXPECT_EQ(findings.configurations(), 0U);
+    EXPECT_FALSE(findings.right());
+}
+
+TEST(SelfCheck, FailsWhereAConfigurationIsNotDecoded)
+{
+    Findings findings;
+    findings.inUse = "generic";
+    findings.blocksRight = true;
+    for (const char* const name : {"avx2", "generic", "component"}) {
+        findings.outcomes.push_back({name, true, 9, {}, 0});
+    }
+    EXPECT_TRUE(findings.right());
+    findings.outcomes[0] = {"avx2", false, 0, {}, 0};
+    EXPECT_TRUE(findings.right());
+    findings.outcomes[0] = {"avx2", true, 8, {}, 0};
+    EXPECT_FALSE(findings.right());
+    findings.outcomes[0] = {"avx2", true, 9, {}, 0};
+    findings.inUse = "avx512";
+    EXPECT_FALSE(findings.right());
+}
+
 TEST(SelfCheck, DigestDependsOnEveryValue)
 {
     std::vector<CheckBatch> batches = checkBatches();

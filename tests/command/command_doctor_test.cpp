@@ -150,6 +150,36 @@ TEST_F(Doctor, LooksAtAsManyBlocksAsAskedFor)
     EXPECT_TRUE(has(examine(frames, {"--blocks", "1000"}).out, "20 of 20"));
 }
 
+TEST_F(Doctor, TellsOfBlocksThatItHasNotLookedAt)
+{
+    const std::vector<SentFrame> frames = sentFrames(40, 17, 6, 1);
+    const std::string line = "Looked at the first 16 blocks alone: the file has more, --blocks N takes them.\n";
+    EXPECT_TRUE(has(examine(frames).out, line));
+    EXPECT_FALSE(has(examine(frames, {"--blocks", "17"}).out, "Looked at"));
+    EXPECT_TRUE(has(examine(frames, {"--blocks", "1"}).out, "Looked at the first block alone: "));
+    EXPECT_EQ(nlohmann::json::parse(examine(frames, {"--json"}).out).at("more_blocks"), true);
+}
+
+TEST_F(Doctor, RefusesBitsWithoutABlock)
+{
+    const std::string soft = softText(sentFrames(40, 2, 6, 1));
+    const std::string bits = bitText(sentFrames(40, 3, 6, 1));
+    expectRefusal(examine(soft, bits), "in.bits:3: more lines than blocks, expected 2");
+    EXPECT_EQ(examine(soft, bits, {"--blocks", "1"}).status, 0);
+}
+
+TEST_F(Doctor, DoesNotTakeValuesThatSayNothingForHealthyOnes)
+{
+    std::string soft = "block,rsc1_sys,rsc1_par,rsc2_par\n";
+    for (unsigned row = 0; row < 44; ++row) {
+        soft += "0,0,0,0\n";
+    }
+    const CommandResult result = examine(soft, std::string(40, '1') + '\n');
+    EXPECT_EQ(result.status, 3);
+    EXPECT_TRUE(has(result.out, "   1 of 1           0       50.0 %  none: as it is")) << result.out;
+    EXPECT_TRUE(has(result.out, "Unrelated: ")) << result.out;
+}
+
 TEST_F(Doctor, LooksAtBlocksOfSeveralSizes)
 {
     std::vector<SentFrame> frames = sentFrames(40, 2, 6, 1);

@@ -23,6 +23,7 @@ TEST_F(SelfTest, Passes)
     EXPECT_TRUE(has(result.out, "\nIn use: ")) << result.out;
     EXPECT_TRUE(has(result.out, "  generic     right  9 of 9 configurations")) << result.out;
     EXPECT_TRUE(has(result.out, "  component   right  9 of 9 configurations")) << result.out;
+    EXPECT_TRUE(has(result.out, "\nChecked: ")) << result.out;
     EXPECT_TRUE(has(result.out, "Passed: this machine gives the promised bits.\n")) << result.out;
 }
 

@@ -34,7 +34,9 @@ TEST_F(CommandVectors, MakesASetAndChecksIt)
     EXPECT_EQ(made.out, "set: 4 blocks in memh\n");
     const CommandResult checked = vectors({"--check", "set"});
     EXPECT_EQ(checked.status, 0) << checked.err;
-    EXPECT_EQ(checked.out, "set: 4 blocks in memh, all as the model decodes them\n");
+    EXPECT_EQ(
+        checked.out,
+        "set: 4 blocks in memh, all as the model decodes them: 4 tags, 176 decisions, 0 ratios, 0 internal values\n");
     const CommandResult one = vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed"});
     EXPECT_EQ(one.out, "set: 1 block in memh\n");
 }

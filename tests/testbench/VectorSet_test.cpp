@@ -348,6 +348,72 @@ TEST_F(VectorSet, RefusesAnotherNumberOfBlocksThanTheManifestNames)
     expectRefused(path() + "/manifest.json: names no format");
 }
 
+TEST_F(VectorSet, CountsWhatIsCompared)
+{
+    make();
+    const morvik::vectors::Compared compared = checkSet(path()).compared;
+    EXPECT_EQ(compared.tags, 4U * 2);
+    EXPECT_EQ(compared.decisions, 4U * 2 * 40);
+    EXPECT_EQ(compared.ratios, 4U * 2 * 40);
+    EXPECT_EQ(compared.internal, 4U * 2 * 4 * 43 * morvik::passSignals.size());
+}
+
+TEST_F(VectorSet, RefusesToCompareLessThanTheManifestTells)
+{
+    settings.formats = {"csv", "memh"};
+    make();
+    const auto good = nlohmann::ordered_json::parse(read("manifest.json"));
+    const std::string manifest = path() + "/manifest.json: ";
+    const auto expectChangedRefused = [&](const auto& change, const std::string& message) {
+        auto json = good;
+        change(json);
+        folder.write("set/manifest.json", json.dump());
+        expectRefused(message);
+    };
+    expectChangedRefused([](auto& json) { json["blocks"].clear(); }, manifest + "names no block");
+    expectChangedRefused([](auto& json) { json["formats"][0]["tables"].clear(); },
+                         manifest + "format csv lacks the table blocks as its parameters make it");
+    expectChangedRefused([](auto& json) { json["formats"][0]["tables"][2]["columns"][0]["bits"] = 2; },
+                         manifest + "format csv lacks the table expected as its parameters make it");
+    expectChangedRefused(
+        [](auto& json) {
+            auto& tables = json["formats"][0]["tables"];
+            tables.push_back(tables[0]);
+        },
+        manifest + "format csv has more tables than its parameters make");
+    expectChangedRefused([](auto& json) { json["formats"][1]["tables"][3]["rows"] = 0; },
+                         manifest + "tells 0 rows of ratios in memh, there are 80");
+    expectChangedRefused([](auto& json) { json["parameters"]["blocks"] = 3; },
+                         manifest + "names 2 random blocks, its parameters make 3");
+    expectChangedRefused([](auto& json) { json["parameters"]["directed"] = true; },
+                         manifest + "names no directed block, its parameters make some");
+    expectChangedRefused([](auto& json) { json["formats"].erase(1); },
+                         path() + "/blocks.memh: is none of the files that manifest.json names, and cannot be checked");
+    expectChangedRefused(
+        [](auto& json) {
+            json["parameters"]["internal"] = false;
+            for (auto& format : json["formats"]) {
+                format["files"].erase(4);
+                format["tables"].erase(4);
+            }
+        },
+        path() + "/internal.csv: is none of the files that manifest.json names, and cannot be checked");
+}
+
+TEST_F(VectorSet, RefusesRowsOfOtherBlocks)
+{
+    settings.formats = {"csv"};
+    make();
+    change("blocks.csv", "44,40\n", "43,40\n");
+    expectRefused(path() + "/blocks.csv:3: first_position 43, the block begins at 44");
+    make();
+    change("blocks.csv", "44,40\n", "44,41\n");
+    expectRefused(path() + "/blocks.csv:3: first_bit 41, the block begins at 40");
+    make();
+    change("expected.csv", "\n1,", "\n0,");
+    expectRefused(path() + "/expected.csv:42: block 0, expected a row of block 1");
+}
+
 TEST(Checksum, IsThatOfTheStandard)
 {
     const support::TemporaryFolder folder;
