@@ -5,6 +5,9 @@
 #include <iostream>
 #include <string>
 
+#include "Files.h"
+#include "Notice.h"
+
 namespace morvik {
 
 namespace {
@@ -12,7 +15,7 @@ namespace {
 /// Writes the one line that ends a failed command.
 int fail(const std::string& name, const std::string& what)
 {
-    std::cerr << name << ": " << what << std::endl;
+    notice(name + ": " + what);
     return badInputOrUsage;
 }
 
@@ -23,12 +26,19 @@ int reportUsage(const CLI::App& app, const CLI::ParseError& error)
     return fail(name, std::string(error.what()) + "; '" + name + " --help' tells what is allowed");
 }
 
+/// Whether all that was printed has arrived; what is left is lost otherwise, and nobody would know.
+int finish(const std::string& name, int status)
+{
+    return std::cout.flush() ? status : fail(name, FileError("<stdout>", cannotBe("written")).what());
+}
+
 int run(const CLI::App& app, const Command& command)
 {
+    const std::string name = app.get_name() + ' ' + command.arguments->get_name();
     try {
-        return command.run();
+        return finish(name, command.run());
     } catch (const std::exception& error) {
-        return fail(app.get_name() + ' ' + command.arguments->get_name(), error.what());
+        return fail(name, error.what());
     }
 }
 
@@ -39,7 +49,7 @@ int runCommandLine(CLI::App& app, const std::vector<Command>& commands, int argc
     try {
         app.parse(argc, argv);
     } catch (const CLI::Success& helpOrVersion) {
-        return app.exit(helpOrVersion);
+        return finish(app.get_name(), app.exit(helpOrVersion));
     } catch (const CLI::ParseError& error) {
         return reportUsage(app, error);
     }

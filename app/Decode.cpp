@@ -119,6 +119,40 @@ std::string decisionLine(const std::vector<std::uint8_t>& bits)
     return line + '\n';
 }
 
+/// Decodes block after block. When an input has a mistake, what comes before it is kept.
+void decodeBlocks(const Options& options,
+                  SoftValueReader& reader,
+                  std::optional<ReferenceBits>& reference,
+                  base::OutputFile& output,
+                  Summary& summary)
+try {
+    // The decoder's messages must never stand between decisions.
+    std::ostream& messages = output.isStandardOutput() ? std::cerr : std::cout;
+    Decoder decoder(options.decoder.generics, messages);
+    decoder.armTrace(options.tracedPasses);
+    SoftBlock block;
+    std::vector<std::uint8_t> bits;
+    while (reader.next(block)) {
+        const auto start = std::chrono::steady_clock::now();
+        decodeBlock(decoder, reader, block, options.decoder.iterations, tagOf(summary.blocks, options), bits);
+        summary.decoding += std::chrono::steady_clock::now() - start;
+        summary.countBlock(bits.size());
+        output.write(decisionLine(bits));
+        output.flush();
+        if (!messages) {
+            throw FileError(output.isStandardOutput() ? "<stderr>" : "<stdout>",
+                            "cannot be written with the decoder's messages");
+        }
+        if (reference) {
+            summary.countErrors(reference->countErrors(bits));
+        }
+    }
+    output.commit();
+} catch (const FileError&) {
+    output.commit();
+    throw;
+}
+
 int decode(const Options& options)
 {
     InputFile input(options.input);
@@ -129,30 +163,10 @@ int decode(const Options& options)
         referenceFile.emplace(*options.reference);
         reference.emplace(referenceFile->stream(), referenceFile->name());
     }
-    OutputFile output(options.output, {options.input, options.reference.value_or(standardStream)});
-
-    // The decoder's messages must never stand between decisions.
-    std::ostream& messages = output.isStandardOutput() ? std::cerr : std::cout;
-    Decoder decoder(options.decoder.generics, messages);
-    decoder.armTrace(options.tracedPasses);
-
+    base::expectOwnFile(options.output, {options.input, options.reference.value_or(options.input)}, "the decisions");
+    base::OutputFile output(options.output);
     Summary summary;
-    SoftBlock block;
-    std::vector<std::uint8_t> bits;
-    while (reader.next(block)) {
-        const auto start = std::chrono::steady_clock::now();
-        decodeBlock(decoder, reader, block, options.decoder.iterations, tagOf(summary.blocks, options), bits);
-        summary.decoding += std::chrono::steady_clock::now() - start;
-        summary.countBlock(bits.size());
-        output.write(decisionLine(bits));
-        if (!messages) {
-            throw FileError(output.isStandardOutput() ? "<stderr>" : "<stdout>",
-                            "cannot be written with the decoder's messages");
-        }
-        if (reference) {
-            summary.countErrors(reference->countErrors(bits));
-        }
-    }
+    decodeBlocks(options, reader, reference, output, summary);
     if (reference) {
         reference->expectEnd();
     }

@@ -4,47 +4,44 @@
 #include <utility>
 
 #include "Files.h"
+#include "simulation/FileKind.h"
 
 namespace morvik {
 
-LineReader::LineReader(std::istream& input, std::string name)
-    : itsInput(input), itsName(std::move(name)), itsBuffer(longest + 2)  // \r, and the null that getline() adds
-{
-}
+LineReader::LineReader(std::istream& input, std::string name) : itsLines(input, longest), itsName(std::move(name)) {}
 
 bool LineReader::next()
 {
     ++itsNumber;
-    itsInput.getline(itsBuffer.data(), static_cast<std::streamsize>(itsBuffer.size()));
-    if (itsInput.bad()) {
+    const base::Lines::Found found = itsLines.next();
+    if (found == base::Lines::Found::unreadable) {
         fail(cannotBe("read"));
     }
-    auto length = static_cast<std::size_t>(itsInput.gcount());
-    if (itsInput.eof()) {
-        if (length == 0) {
-            return false;
-        }
-    } else if (itsInput.good()) {
-        --length;  // gcount() includes the \n
+    const char* const reason = itsNumber == 1 ? simulation::whyNoText(itsLines.text()) : nullptr;
+    if (reason != nullptr) {
+        throw FileError(itsName, reason);
     }
-    itsText = std::string_view(itsBuffer.data(), length);
-    if (!itsText.empty() && itsText.back() == '\r') {
-        itsText.remove_suffix(1);
-    }
-    if (itsInput.fail() || itsText.size() > longest) {
+    if (found == base::Lines::Found::tooLong) {
         fail("line is too long, allowed are " + std::to_string(longest) + " characters");
     }
-    return true;
+    return found == base::Lines::Found::line;
 }
 
 std::string_view LineReader::text() const
 {
-    return itsText;
+    return itsLines.text();
 }
 
 std::size_t LineReader::number() const
 {
     return itsNumber;
+}
+
+void LineReader::expectAnEnd(std::size_t first) const
+{
+    if (itsNumber - first >= mostBlank) {
+        failAt(first, "blank lines without an end, allowed are " + std::to_string(mostBlank));
+    }
 }
 
 void LineReader::fail(const std::string& what) const

@@ -61,6 +61,7 @@ void ReferenceBits::expectEnd()
         if (!itsLines.text().empty()) {
             itsLines.fail("more lines than blocks, expected " + std::to_string(blocks));
         }
+        itsLines.expectAnEnd(blocks);
     }
 }
 

@@ -6,18 +6,19 @@
 #include <string_view>
 
 #include "Text.h"
+#include "base/Csv.h"
 #include "standard/BlockSizes.h"
 
 namespace morvik {
 
 namespace {
 
-/// Takes the text up to the next comma, or all of it, off the front of `row`.
+/// Takes the text up to the next comma, or all of it, off the front of `row`. Blanks around it do not count.
 std::string_view takeField(std::string_view& row)
 {
     const std::string_view field = row.substr(0, row.find(','));
     row.remove_prefix(std::min(field.size() + 1, row.size()));
-    return field;
+    return base::trimmed(field);
 }
 
 bool isLabel(std::string_view text)
@@ -33,7 +34,7 @@ SoftValueReader::SoftValueReader(std::istream& input, const std::string& name) :
     if (!itsLines.next()) {
         itsLines.fail("no header, expected " + header);
     }
-    if (itsLines.text() != softValueHeader) {
+    if (base::fieldsOf(itsLines.text()) != base::fieldsOf(softValueHeader)) {
         itsLines.fail("wrong header " + shown(itsLines.text()) + ", expected " + header);
     }
     advance();
@@ -88,7 +89,7 @@ void SoftValueReader::advance()
 
 void SoftValueReader::readLabel()
 {
-    if (itsLines.text().empty()) {
+    if (base::trimmed(itsLines.text()).empty()) {
         expectOnlyBlankLines();
         itsAtEnd = true;
         return;
@@ -104,9 +105,10 @@ void SoftValueReader::expectOnlyBlankLines()
 {
     const std::size_t first = itsLines.number();
     while (itsLines.next()) {
-        if (!itsLines.text().empty()) {
+        if (!base::trimmed(itsLines.text()).empty()) {
             itsLines.failAt(first, "blank line, allowed at the end only");
         }
+        itsLines.expectAnEnd(first);
     }
 }
 

@@ -100,13 +100,14 @@ void checkUnits(const Options& options, const Division& division)
     }
 }
 
-vectors::FileWriter openOutput(const Options& options)
+base::OutputFile openOutput(const Options& options)
 {
-    if (options.output == standardStream) {
-        return vectors::FileWriter::standardOutput();
+    base::expectOwnFile(options.output, {options.input}, "its traced values");
+    base::OutputFile file(options.output);
+    if (options.format == "npy" && !file.isReplaced()) {
+        throw simulation::Error("--format npy needs a regular file, by --output FILE");
     }
-    expectOwnFile(options.output, {options.input}, "its traced values");
-    return vectors::FileWriter(options.output);
+    return file;
 }
 
 std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const Division& division)
@@ -126,9 +127,6 @@ int run(Options options)
     selectPasses(options, selection);
     if (options.format == "text" && (!selection.signals.empty() || !selection.units.empty())) {
         throw simulation::Error("--signals and --units need --format csv, vcd or npy: the text is the library's own");
-    }
-    if (options.format == "npy" && options.output == standardStream) {
-        throw simulation::Error("--format npy needs --output FILE");
     }
     const SoftBlock block = readBlock(options.input, options.block);
     if (options.format == "text") {

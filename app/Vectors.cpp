@@ -1,7 +1,6 @@
 // Vectors: the subcommand that makes stimulus and expected values for a test bench.
 #include "Vectors.h"
 
-#include <iostream>
 #include <memory>
 #include <string>
 #include <vector>
@@ -9,6 +8,8 @@
 #include "Arguments.h"
 #include "DecoderOptions.h"
 #include "Lists.h"
+#include "Notice.h"
+#include "base/Printable.h"
 #include "simulation/Error.h"
 #include "simulation/Point.h"
 #include "simulation/Thousandths.h"
@@ -62,13 +63,6 @@ std::string commandOf(const vectors::Settings& settings)
     return command;
 }
 
-void print(const std::string& line)
-{
-    if (!(std::cout << line << std::endl)) {
-        throw simulation::Error("<stdout>: cannot be written");
-    }
-}
-
 std::string blocksAndFormats(const vectors::Manifest& manifest)
 {
     const auto name = [](const vectors::ManifestFormat& format) {
@@ -95,19 +89,20 @@ int make(const Options& options)
         throw simulation::Error("--blocks 0 and --no-directed together leave no block");
     }
     manifest.command = commandOf(manifest.settings);
-    print(options.output + ": " + blocksAndFormats(vectors::makeSet(options.output, manifest)));
+    print(base::visible(options.output) + ": " + blocksAndFormats(vectors::makeSet(options.output, manifest)) + '\n');
     return success;
 }
 
-int check(const std::string& folder)
+int check(const std::string& path)
 {
-    const vectors::CheckedSet set = vectors::checkSet(folder);
+    const vectors::CheckedSet set = vectors::checkSet(path);
+    const std::string folder = base::visible(path);
     if (set.difference) {
-        print(folder + ": " + *set.difference);
+        print(folder + ": " + *set.difference + '\n');
         return differencesFound;
     }
     print(folder + ": " + blocksAndFormats(set.manifest) +
-          ", all as the model decodes them: " + comparedText(set.compared));
+          ", all as the model decodes them: " + comparedText(set.compared) + '\n');
     return success;
 }
 

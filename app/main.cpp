@@ -3,9 +3,11 @@
 
 #include "CommandLine.h"
 #include "Programs.h"
+#include "base/StandardStreams.h"
 
 int main(int argc, char** argv)
 {
+    base::prepareStandardStreams();
     std::ios::sync_with_stdio(false);  // a trace writes millions of small pieces
 
     const morvik::Program program = morvik::morvikProgram();

@@ -7,6 +7,7 @@
 
 #include "CommandLine.h"
 #include "Programs.h"
+#include "base/StandardStreams.h"
 #include "ber/BerOptions.h"
 #include "ber/Interruption.h"
 #include "simulation/Error.h"
@@ -66,6 +67,7 @@ int runAsOtherRank(int argc, const char* const* argv)
 
 int main(int argc, char** argv)
 {
+    base::prepareStandardStreams();  // before MPI opens anything
     MpiWorld world;
     return world.rank() == 0 ? runAsRankZero(world, argc, argv) : runAsOtherRank(argc, argv);
 }

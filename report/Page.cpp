@@ -11,7 +11,7 @@
 #include "PageParts.h"
 #include "Series.h"
 #include "Wording.h"
-#include "simulation/AtomicFile.h"
+#include "base/OutputFile.h"
 
 namespace report {
 
@@ -332,7 +332,7 @@ void checkReport(const std::string& fileName)
     if (std::filesystem::path(fileName).extension() != ".html") {
         throw std::runtime_error(fileName + ": is no name for a report, allowed are names that end in .html");
     }
-    simulation::checkWritable(fileName);
+    base::checkWritable(fileName);
 }
 
 void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run)
@@ -350,7 +350,7 @@ void writeReport(const std::string& fileName, const std::vector<Curve>& curves, 
             "<script type=\"application/json\" id=\"data\">"
          << dataJson(views) << "</script>\n<script>\n"
          << pageScript << "</script>\n</body>\n</html>\n";
-    simulation::writeAtomically(fileName, page.str());
+    base::writeFile(fileName, page.str());
 }
 
 }  // namespace report

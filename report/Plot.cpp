@@ -10,7 +10,7 @@
 #include "PlotScript.h"
 #include "Series.h"
 #include "Wording.h"
-#include "simulation/AtomicFile.h"
+#include "base/OutputFile.h"
 
 namespace report {
 
@@ -105,7 +105,7 @@ std::string labelled(std::string svg, const std::string& title, const std::strin
 void checkPlot(const std::string& fileName)
 {
     const std::string suffix = suffixOf(fileName);
-    simulation::checkWritable(fileName);
+    base::checkWritable(fileName);
     draw(fileName, terminalCommand(suffix) + '\n');
 }
 
@@ -116,7 +116,7 @@ void writePlot(const std::string& fileName, const std::vector<Curve>& curves, co
     if (suffix == ".svg") {
         picture = labelled(std::move(picture), title, description(curves));
     }
-    simulation::writeAtomically(fileName, picture);
+    base::writeFile(fileName, picture);
 }
 
 void writeDrawing(const std::string& fileName, const Drawing& drawing)
@@ -126,7 +126,7 @@ void writeDrawing(const std::string& fileName, const Drawing& drawing)
     if (suffix == ".svg") {
         picture = labelled(std::move(picture), drawing.title(), drawing.description());
     }
-    simulation::writeAtomically(fileName, picture);
+    base::writeFile(fileName, picture);
 }
 
 }  // namespace report

@@ -11,6 +11,7 @@
 #include <system_error>
 
 #include "Wording.h"
+#include "base/Csv.h"
 #include "simulation/ResultFiles.h"
 #include "simulation/TextFile.h"
 
@@ -18,25 +19,10 @@ namespace report {
 
 namespace {
 
-constexpr std::string_view blanks = " \t\r";
-
-std::string_view trimmed(std::string_view text)
-{
-    const std::size_t start = text.find_first_not_of(blanks);
-    return start == std::string_view::npos ? std::string_view()
-                                           : text.substr(start, text.find_last_not_of(blanks) - start + 1);
-}
-
 std::vector<std::string> fieldsOf(std::string_view line)
 {
-    std::vector<std::string> fields;
-    std::size_t comma = line.find(',');
-    for (; comma != std::string_view::npos; comma = line.find(',')) {
-        fields.emplace_back(trimmed(line.substr(0, comma)));
-        line.remove_prefix(comma + 1);
-    }
-    fields.emplace_back(trimmed(line));
-    return fields;
+    const std::vector<std::string_view> fields = base::fieldsOf(line);
+    return {fields.begin(), fields.end()};
 }
 
 template <class Number>
@@ -58,7 +44,7 @@ public:
         std::istringstream lines(isJson ? csvText(simulation::readResults(itsName)) : simulation::readText(itsName));
         for (std::string line; std::getline(lines, line);) {
             ++itsLine;
-            take(trimmed(line));
+            take(base::trimmed(line));
         }
         if (itsColumns.empty()) {
             throw std::runtime_error(itsName + ": has no line that names columns");
@@ -82,9 +68,9 @@ private:
             return;
         }
         if (line[0] == '#') {
-            const std::string_view comment = trimmed(line.substr(1));
+            const std::string_view comment = base::trimmed(line.substr(1));
             if (comment.substr(0, titleMark.size()) == titleMark) {
-                itsTitle = trimmed(comment.substr(titleMark.size()));
+                itsTitle = base::trimmed(comment.substr(titleMark.size()));
             }
         } else if (itsColumns.empty()) {
             takeColumns(fieldsOf(line));

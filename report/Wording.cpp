@@ -6,6 +6,8 @@
 #include <charconv>
 #include <cmath>
 
+#include "base/Printable.h"
+
 namespace report {
 
 namespace {
@@ -13,33 +15,6 @@ namespace {
 bool isContinuation(char c)
 {
     return (static_cast<unsigned char>(c) & 0xc0U) == 0x80U;
-}
-
-/// The length of the character that the text begins with; 0 where there is none.
-std::size_t lengthOfFirst(std::string_view text)
-{
-    const auto byteAt = [text](std::size_t i) {
-        return static_cast<unsigned char>(text[i]);
-    };
-    const unsigned first = byteAt(0);
-    if (first < 0x80) {
-        return 1;
-    }
-    const std::size_t length = first >= 0xf0 ? 4 : first >= 0xe0 ? 3 : 2;
-    if (first < 0xc2 || first > 0xf4 || text.size() < length) {
-        return 0;
-    }
-    for (std::size_t i = 1; i < length; ++i) {
-        if (!isContinuation(text[i])) {
-            return 0;
-        }
-    }
-    // Forms longer than need be, surrogates, what is beyond the last character, and two that XML does not have.
-    const unsigned second = byteAt(1);
-    const bool isNone = (first == 0xe0 && second < 0xa0) || (first == 0xed && second >= 0xa0) ||
-                        (first == 0xf0 && second < 0x90) || (first == 0xf4 && second >= 0x90) ||
-                        (first == 0xef && second == 0xbf && byteAt(2) >= 0xbe);
-    return isNone ? 0 : length;
 }
 
 std::string converted(double value, std::chars_format format, int digits)
@@ -55,7 +30,7 @@ std::string printable(std::string_view text)
 {
     std::string result;
     while (!text.empty()) {
-        const std::size_t length = lengthOfFirst(text);
+        const std::size_t length = base::lengthOfFirst(text);
         const bool isControl = length == 1 && (text[0] < ' ' || text[0] == '\x7f');
         if (length == 0 || isControl) {
             result += isControl ? ' ' : '?';

@@ -5,11 +5,11 @@
 #include <system_error>
 #include <utility>
 
-#include "AtomicFile.h"
 #include "CompleteResults.h"
 #include "Error.h"
 #include "ResultFiles.h"
 #include "TextFile.h"
+#include "base/OutputFile.h"
 
 namespace simulation {
 
@@ -35,7 +35,7 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     if (itsFile->isTaken()) {
         throw Error(itsOutput + ": another run is writing it; wait for that to end, or choose another name");
     }
-    checkWritable(itsOutput);
+    base::checkWritable(itsOutput);
     const bool isUnfinished = !itsFile->isNew();
     const bool hasResults = hasContent(itsOutput);
     if (earlier == Earlier::refuse) {

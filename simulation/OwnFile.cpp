@@ -5,8 +5,8 @@
 
 #include <utility>
 
-#include "AtomicFile.h"
 #include "Error.h"
+#include "base/OutputFile.h"
 
 namespace simulation {
 
@@ -15,7 +15,7 @@ OwnFile::OwnFile(std::string fileName) : itsName(std::move(fileName)), itsFile(-
     // Between the two steps the file may have gone, or another may have taken its place, with the lock on that one.
     constexpr int patience = 100;  // with a file system that tells files apart by nothing steady
     for (int i = 0; i < patience && !itsIsTaken && !itsFile.isAt(itsName); ++i) {
-        itsFile = Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0666));
+        itsFile = base::Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0666));
         itsIsTaken = itsFile.isOpen() && !itsFile.lock();
     }
 }
@@ -39,7 +39,11 @@ bool OwnFile::isNew() const
 
 void OwnFile::write(const std::string& content)
 {
-    itsFile = writeLocked(itsName, content, true);
+    base::OutputFile file(itsName);
+    file.lock();  // before it has the name
+    file.secure();
+    file.write(content);
+    itsFile = file.commit();
 }
 
 void OwnFile::remove()

@@ -4,7 +4,7 @@
 
 #include <string>
 
-#include "Descriptor.h"
+#include "base/Descriptor.h"
 
 namespace simulation {
 
@@ -33,7 +33,7 @@ public:
 
 private:
     std::string itsName;
-    Descriptor itsFile;
+    base::Descriptor itsFile;
     bool itsIsTaken = false;
 };
 

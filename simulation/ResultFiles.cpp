@@ -7,11 +7,12 @@
 #include <string_view>
 #include <vector>
 
-#include "AtomicFile.h"
 #include "Columns.h"
 #include "Error.h"
 #include "Shown.h"
 #include "TextFile.h"
+#include "base/Csv.h"
+#include "base/OutputFile.h"
 
 namespace simulation {
 
@@ -39,19 +40,6 @@ void readField(const Column& column, const std::string& text, ResultRow& row, co
     }
 }
 
-std::vector<std::string> splitAt(char separator, const std::string& line)
-{
-    std::vector<std::string> fields(1);
-    for (const char c : line) {
-        if (c == separator) {
-            fields.emplace_back();
-        } else {
-            fields.back() += c;
-        }
-    }
-    return fields;
-}
-
 /// Throws Error unless the row's numbers of errors are possible, so that rates and bounds can be computed.
 void checkCounts(const ResultRow& row, const std::string& place)
 {
@@ -69,14 +57,14 @@ void checkCounts(const ResultRow& row, const std::string& place)
 
 ResultRow csvRow(const std::string& line, const std::string& place)
 {
-    const std::vector<std::string> fields = splitAt(',', line);
+    const std::vector<std::string_view> fields = base::fieldsOf(line);
     if (fields.size() != columns().size()) {
         throw Error(place + ": " + std::to_string(fields.size()) + " fields, expected " +
                     std::to_string(columns().size()));
     }
     ResultRow row;
     for (std::size_t i = 0; i < fields.size(); ++i) {
-        readField(columns()[i], fields[i], row, place);
+        readField(columns()[i], std::string(fields[i]), row, place);
     }
     checkCounts(row, place);
     return row;
@@ -98,7 +86,7 @@ Results parseCsv(const std::string& text, const std::string& fileName)
 {
     std::istringstream lines(text);
     std::string line;
-    if (!nextLine(lines, line) || line != headerLine()) {
+    if (!nextLine(lines, line) || base::fieldsOf(line) != base::fieldsOf(headerLine())) {
         throw Error(fileName + ":1: no header of a result file, expected \"" + headerLine() + '"');
     }
     Results results;
@@ -214,7 +202,7 @@ std::string jsonText(const Results& results)
 void writeResults(const std::string& fileName, const Results& results)
 {
     const bool isCsv = formatOf(fileName) == ResultFormat::csv;
-    writeAtomically(fileName, isCsv ? csvText(results) : jsonText(results));
+    base::writeFile(fileName, isCsv ? csvText(results) : jsonText(results));
 }
 
 Results readResults(const std::string& fileName)

@@ -3,8 +3,11 @@
 
 #include <array>
 #include <fstream>
+#include <string_view>
 
 #include "Error.h"
+#include "FileKind.h"
+#include "base/Csv.h"
 
 namespace simulation {
 
@@ -17,10 +20,24 @@ std::string readText(const std::string& fileName)
     std::string text;
     std::array<char, 65536> part = {};
     while (file.read(part.data(), part.size()) || file.gcount() > 0) {
-        text.append(part.data(), static_cast<std::size_t>(file.gcount()));
+        const std::string_view next(part.data(), static_cast<std::size_t>(file.gcount()));
+        const char* const reason = text.empty() ? whyNoText(next) : nullptr;
+        if (reason != nullptr) {
+            throw Error(fileName + ": " + reason);
+        }
+        if (next.find('\0') != std::string_view::npos) {
+            throw Error(fileName + ": is no text, it has a null character");
+        }
+        if (text.size() + next.size() > largestText) {
+            throw Error(fileName + ": is too large, allowed are " + std::to_string(largestText) + " bytes");
+        }
+        text += next;
     }
     if (file.bad()) {
         throw fileError(fileName, "read");
+    }
+    if (text.compare(0, base::byteOrderMark.size(), base::byteOrderMark) == 0) {
+        text.erase(0, base::byteOrderMark.size());
     }
     return text;
 }

@@ -2,11 +2,15 @@
 #ifndef MORVIK_SIMULATION_TEXTFILE_H
 #define MORVIK_SIMULATION_TEXTFILE_H
 
+#include <cstddef>
 #include <string>
 
 namespace simulation {
 
-/// The content of a file. Throws Error.
+/// As much as can be read: more than any file of results has.
+constexpr std::size_t largestText = std::size_t{1} << 28;
+
+/// The content of a file of text, without a byte order mark. Throws Error, also when it is no text or too large.
 std::string readText(const std::string& fileName);
 
 }  // namespace simulation

@@ -6,31 +6,39 @@
 #include <utility>
 
 #include "simulation/Error.h"
+#include "simulation/FileKind.h"
 
 namespace morvik {
 
 LineFile::LineFile(const std::string& fileName)
-    : itsFile(std::make_unique<std::ifstream>(fileName, std::ios::binary)), itsInput(*itsFile), itsName(fileName)
+    : itsFile(std::make_unique<std::ifstream>(fileName, std::ios::binary)),
+      itsLines(*itsFile, longest),
+      itsName(fileName)
 {
     if (!*itsFile) {
         throw simulation::fileError(fileName, "opened");
     }
 }
 
-LineFile::LineFile(std::istream& input, std::string name) : itsInput(input), itsName(std::move(name)) {}
+LineFile::LineFile(std::istream& input, std::string name) : itsLines(input, longest), itsName(std::move(name)) {}
 
 bool LineFile::next()
 {
-    if (!std::getline(itsInput, itsLine)) {
-        itsLine.clear();
-        if (itsInput.bad()) {
-            throw simulation::fileError(itsName, "read");
-        }
+    const base::Lines::Found found = itsLines.next();
+    itsLine = itsLines.text();
+    if (found == base::Lines::Found::unreadable) {
+        throw simulation::fileError(itsName, "read");
+    }
+    const char* const reason = itsNumber == 0 ? simulation::whyNoText(itsLine) : nullptr;
+    if (reason != nullptr) {
+        throw simulation::Error(itsName + ": " + reason);
+    }
+    if (found == base::Lines::Found::end) {
         return false;
     }
     ++itsNumber;
-    if (!itsLine.empty() && itsLine.back() == '\r') {
-        itsLine.pop_back();
+    if (found == base::Lines::Found::tooLong) {
+        fail("line is too long, allowed are " + std::to_string(longest) + " characters");
     }
     return true;
 }

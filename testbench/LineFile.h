@@ -2,16 +2,22 @@
 #ifndef MORVIK_TESTBENCH_LINEFILE_H
 #define MORVIK_TESTBENCH_LINEFILE_H
 
+#include <cstddef>
 #include <cstdint>
 #include <istream>
 #include <memory>
 #include <string>
+
+#include "base/Lines.h"
 
 namespace morvik {
 
 /// Lines end in \n or \r\n. What is wrong is thrown as a simulation::Error that opens with the place, NAME:LINE.
 class LineFile {
 public:
+    /// Longest line in characters, more than a value of any width needs.
+    static constexpr std::size_t longest = std::size_t{1} << 20;
+
     explicit LineFile(const std::string& fileName);
 
     /// `input` outlives the file; `name` is what messages call it.
@@ -39,7 +45,7 @@ public:
 
 private:
     std::unique_ptr<std::istream> itsFile;  // that was opened here
-    std::istream& itsInput;
+    base::Lines itsLines;
     std::string itsName;
     std::string itsLine;
     std::uint32_t itsNumber = 0;

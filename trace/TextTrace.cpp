@@ -29,7 +29,7 @@ std::optional<std::int64_t> beginningPass(std::string_view line)
 /// Takes a trace as it is written, and lets through all lines but the tables of other half-iterations.
 class PassFilter : public std::streambuf {
 public:
-    PassFilter(const Selection& selection, vectors::FileWriter file)
+    PassFilter(const Selection& selection, base::OutputFile file)
         : itsFirst(selection.first), itsLast(selection.last), itsFile(std::move(file))
     {
     }
@@ -40,7 +40,7 @@ public:
         if (itsFailure) {
             std::rethrow_exception(itsFailure);
         }
-        itsFile.close();
+        itsFile.commit();
     }
 
 protected:
@@ -93,7 +93,7 @@ private:
 
     std::int64_t itsFirst;
     std::int64_t itsLast;
-    vectors::FileWriter itsFile;
+    base::OutputFile itsFile;
     std::string itsLine;  // as far as it has come
     std::string itsDashes;
     bool itsShows = true;
@@ -105,7 +105,7 @@ private:
 void writeText(const SoftBlock& block,
                const veltra_ip_morvik_v1_0_generics& generics,
                const Selection& selection,
-               vectors::FileWriter file)
+               base::OutputFile file)
 {
     PassFilter filter(selection, std::move(file));
     std::ostream messages(&filter);

@@ -32,13 +32,13 @@ std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<vectors::TableWriter> ta
                                         const Selection& selection);
 
 /// Waveforms as a value change dump (IEEE 1364-2001, clause 18).
-std::unique_ptr<TraceWriter> vcdTrace(vectors::FileWriter file, const Division& division, const Selection& selection);
+std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const Division& division, const Selection& selection);
 
 /// Writes the library's own trace of the selected half-iterations, with the input streams before them.
 void writeText(const SoftBlock& block,
                const veltra_ip_morvik_v1_0_generics& generics,
                const Selection& selection,
-               vectors::FileWriter file);
+               base::OutputFile file);
 
 }  // namespace morvik::trace
 

@@ -22,7 +22,7 @@ std::string codeOf(std::size_t number)
 
 }  // namespace
 
-VcdFile::VcdFile(vectors::FileWriter file, const std::string& comment) : itsFile(std::move(file))
+VcdFile::VcdFile(base::OutputFile file, const std::string& comment) : itsFile(std::move(file))
 {
     append("$comment " + comment + " $end\n$timescale 1 ns $end\n");
 }
@@ -94,7 +94,7 @@ void VcdFile::finish()
 {
     writeTime();
     itsFile.write(itsPart);
-    itsFile.close();
+    itsFile.commit();
 }
 
 void VcdFile::writeValue(const Variable& variable)

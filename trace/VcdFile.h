@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-#include "vectors/FileWriter.h"
+#include "base/OutputFile.h"
 
 namespace morvik::trace {
 
@@ -17,7 +17,7 @@ namespace morvik::trace {
 /// as it was takes no room.
 class VcdFile {
 public:
-    VcdFile(vectors::FileWriter file, const std::string& comment);
+    VcdFile(base::OutputFile file, const std::string& comment);
 
     void beginScope(const std::string& name);
     void endScope();
@@ -51,7 +51,7 @@ private:
     void writeTime();
     void append(std::string_view text);
 
-    vectors::FileWriter itsFile;
+    base::OutputFile itsFile;
     std::string itsPart;  // of the text, that is not written yet
     std::vector<Variable> itsVariables;
     std::uint64_t itsTime = 0;

@@ -15,7 +15,7 @@ namespace {
 /// segment, and those of the tail.
 class VcdTrace : public TraceWriter {
 public:
-    VcdTrace(vectors::FileWriter file, const Division& division, Selection selection)
+    VcdTrace(base::OutputFile file, const Division& division, Selection selection)
         : itsSelection(std::move(selection)),
           itsLength(division.segmentLength() + tailSteps),
           itsFile(std::move(file),
@@ -122,7 +122,7 @@ private:
 
 }  // namespace
 
-std::unique_ptr<TraceWriter> vcdTrace(vectors::FileWriter file, const Division& division, const Selection& selection)
+std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const Division& division, const Selection& selection)
 {
     return std::make_unique<VcdTrace>(std::move(file), division, selection);
 }

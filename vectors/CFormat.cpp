@@ -80,16 +80,16 @@ public:
     void finish() override
     {
         itsFile.write(end + std::string("\n"));
-        itsFile.close();
-        FileWriter header(itsFolder + '/' + itsTable.name + ".h");
+        itsFile.commit();
+        base::OutputFile header(itsFolder + '/' + itsTable.name + ".h");
         header.write(headerText(itsTable, itsRows));
-        header.close();
+        header.commit();
     }
 
 private:
     std::string itsFolder;
     Table itsTable;
-    FileWriter itsFile;
+    base::OutputFile itsFile;
     std::string itsSuffix;
     std::string itsLine;
     std::uint64_t itsRows = 0;

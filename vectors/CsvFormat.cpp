@@ -3,6 +3,7 @@
 
 #include "Formats.h"
 #include "Numbers.h"
+#include "base/Csv.h"
 #include "simulation/Shown.h"
 #include "testbench/LineFile.h"
 
@@ -26,7 +27,7 @@ std::string header(const Table& table)
 
 class CsvWriter : public TableWriter {
 public:
-    CsvWriter(FileWriter file, const Table& table) : itsFile(std::move(file))
+    CsvWriter(base::OutputFile file, const Table& table) : itsFile(std::move(file))
     {
         itsFile.write(header(table) + '\n');
     }
@@ -44,11 +45,11 @@ public:
 
     void finish() override
     {
-        itsFile.close();
+        itsFile.commit();
     }
 
 private:
-    FileWriter itsFile;
+    base::OutputFile itsFile;
     std::string itsLine;
 };
 
@@ -56,7 +57,7 @@ class CsvReader : public TableReader {
 public:
     CsvReader(const std::string& folder, Table table) : itsTable(std::move(table)), itsFile(fileOf(folder, itsTable))
     {
-        if (!itsFile.next() || itsFile.line() != header(itsTable)) {
+        if (!itsFile.next() || base::fieldsOf(itsFile.line()) != base::fieldsOf(header(itsTable))) {
             itsFile.fail("expected \"" + header(itsTable) + '"');
         }
     }
@@ -67,14 +68,19 @@ public:
             return false;
         }
         std::string_view rest = itsFile.line();
+        takeBlanks(rest);
         itsBlock = takeInteger(rest);
         bool isRow = itsBlock.has_value();
         row.resize(itsTable.columns.size());
         for (std::size_t i = 0; isRow && i < row.size(); ++i) {
-            const auto value = take(rest, ",") ? takeInteger(rest) : std::nullopt;
+            takeBlanks(rest);
+            const bool isNext = take(rest, ",");
+            takeBlanks(rest);
+            const auto value = isNext ? takeInteger(rest) : std::nullopt;
             isRow = value.has_value();
             row[i] = value.value_or(0);
         }
+        takeBlanks(rest);
         if (!isRow || !rest.empty()) {
             itsFile.fail("row " + simulation::shown(itsFile.line()) + ", expected " + std::to_string(row.size() + 1) +
                          " decimal integers with commas between them");
@@ -101,7 +107,7 @@ private:
 
 }  // namespace
 
-std::unique_ptr<TableWriter> csvWriter(FileWriter file, const Table& table)
+std::unique_ptr<TableWriter> csvWriter(base::OutputFile file, const Table& table)
 {
     return std::make_unique<CsvWriter>(std::move(file), table);
 }
@@ -109,7 +115,7 @@ std::unique_ptr<TableWriter> csvWriter(FileWriter file, const Table& table)
 const Format csvFormat = {"csv",
                           [](const Table& table) { return std::vector<std::string>{table.name + ".csv"}; },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
-                              return csvWriter(FileWriter(fileOf(folder, table)), table);
+                              return csvWriter(base::OutputFile(fileOf(folder, table)), table);
                           },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
                               return std::make_unique<CsvReader>(folder, table);

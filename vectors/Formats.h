@@ -2,8 +2,8 @@
 #ifndef MORVIK_VECTORS_FORMATS_H
 #define MORVIK_VECTORS_FORMATS_H
 
-#include "FileWriter.h"
 #include "Table.h"
+#include "base/OutputFile.h"
 
 namespace morvik::vectors {
 
@@ -20,8 +20,8 @@ extern const Format npyFormat;
 extern const Format cFormat;
 
 /// Write a table to a file of any name. What csvWriter gets need not be a file that seeks.
-std::unique_ptr<TableWriter> csvWriter(FileWriter file, const Table& table);
-std::unique_ptr<TableWriter> npyWriter(FileWriter file, const Table& table);
+std::unique_ptr<TableWriter> csvWriter(base::OutputFile file, const Table& table);
+std::unique_ptr<TableWriter> npyWriter(base::OutputFile file, const Table& table);
 
 /// The bits of the machine's integer that holds any value of the table, and whether it has a sign.
 struct Storage {

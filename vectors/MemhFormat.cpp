@@ -55,12 +55,12 @@ public:
 
     void finish() override
     {
-        itsFile.close();
+        itsFile.commit();
     }
 
 private:
     Table itsTable;
-    FileWriter itsFile;
+    base::OutputFile itsFile;
     std::string itsWord;
 };
 

@@ -37,7 +37,7 @@ std::string header(const Table& table, std::uint64_t rows)
 
 class NpyWriter : public TableWriter {
 public:
-    NpyWriter(FileWriter file, Table table)
+    NpyWriter(base::OutputFile file, Table table)
         : itsTable(std::move(table)), itsBytes(storageOf(itsTable).bits / 8), itsFile(std::move(file))
     {
         itsFile.write(header(itsTable, 0));
@@ -58,13 +58,13 @@ public:
     void finish() override
     {
         itsFile.overwriteStart(header(itsTable, itsRows));
-        itsFile.close();
+        itsFile.commit();
     }
 
 private:
     Table itsTable;
     unsigned itsBytes;
-    FileWriter itsFile;
+    base::OutputFile itsFile;
     std::string itsPart;
     std::uint64_t itsRows = 0;
 };
@@ -140,7 +140,7 @@ private:
 
 }  // namespace
 
-std::unique_ptr<TableWriter> npyWriter(FileWriter file, const Table& table)
+std::unique_ptr<TableWriter> npyWriter(base::OutputFile file, const Table& table)
 {
     return std::make_unique<NpyWriter>(std::move(file), table);
 }
@@ -148,7 +148,7 @@ std::unique_ptr<TableWriter> npyWriter(FileWriter file, const Table& table)
 const Format npyFormat = {"npy",
                           [](const Table& table) { return std::vector<std::string>{table.name + ".npy"}; },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
-                              return npyWriter(FileWriter(fileOf(folder, table)), table);
+                              return npyWriter(base::OutputFile(fileOf(folder, table)), table);
                           },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
                               return std::make_unique<NpyReader>(folder, table);

@@ -2,6 +2,7 @@
 #ifndef MORVIK_VECTORS_NUMBERS_H
 #define MORVIK_VECTORS_NUMBERS_H
 
+#include <algorithm>
 #include <charconv>
 #include <cstdint>
 #include <optional>
@@ -18,6 +19,12 @@ inline bool take(std::string_view& rest, std::string_view text)
     }
     rest.remove_prefix(text.size());
     return true;
+}
+
+/// Takes blanks, if the text begins with some.
+inline void takeBlanks(std::string_view& rest)
+{
+    rest.remove_prefix(std::min(rest.find_first_not_of(" \t"), rest.size()));
 }
 
 inline std::optional<std::int64_t> takeInteger(std::string_view& rest)

@@ -4,20 +4,18 @@
 #include <algorithm>
 #include <filesystem>
 #include <set>
-#include <system_error>
 
 #include "Blocks.h"
 #include "Checksum.h"
 #include "Core.h"
-#include "simulation/AtomicFile.h"
+#include "SetFolder.h"
+#include "base/OutputFile.h"
 #include "simulation/Error.h"
 #include "simulation/TextFile.h"
 
 namespace morvik::vectors {
 
 namespace {
-
-namespace fs = std::filesystem;
 
 std::string pathOf(const std::string& folder, const std::string& name)
 {
@@ -27,29 +25,6 @@ std::string pathOf(const std::string& folder, const std::string& name)
 std::string manifestIn(const std::string& folder)
 {
     return pathOf(folder, manifestName);
-}
-
-/// Makes the folder, or removes the set that it holds: first the manifest, without which the rest is no set.
-void clearFolder(const std::string& folder)
-{
-    std::error_code problem;
-    fs::create_directories(folder, problem);
-    if (problem || !fs::is_directory(folder)) {
-        throw simulation::Error(folder + ": cannot be made" + (problem ? ": " + problem.message() : ""));
-    }
-    if (fs::is_empty(folder)) {
-        return;
-    }
-    if (!fs::exists(manifestIn(folder))) {
-        throw simulation::Error(folder + ": is not empty and holds no " + manifestName + " of an earlier set");
-    }
-    const Manifest earlier = parseManifest(simulation::readText(manifestIn(folder)), manifestIn(folder));
-    fs::remove(manifestIn(folder));
-    for (const ManifestFormat& format : earlier.formats) {
-        for (const ManifestFile& file : format.files) {
-            fs::remove(pathOf(folder, file.name));
-        }
-    }
 }
 
 /// "decision 3 is 1, expected says 0"
@@ -179,7 +154,7 @@ void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
         }
     }
     for (const std::string& name : others) {
-        if (fs::exists(pathOf(folder, name))) {
+        if (std::filesystem::exists(pathOf(folder, name))) {
             throw simulation::Error(pathOf(folder, name) + ": is none of the files that " + manifestName +
                                     " names, and cannot be checked");
         }
@@ -228,10 +203,10 @@ std::optional<std::string> checkFormat(const std::string& folder,
 
 Manifest makeSet(const std::string& folder, Manifest manifest)
 {
-    clearFolder(folder);
+    SetFolder set(folder);
     std::vector<BlockWriter> writers;
     for (const std::string& name : manifest.settings.formats) {
-        writers.emplace_back(folder, *findFormat(name), manifest.settings);
+        writers.emplace_back(set.aside(), *findFormat(name), manifest.settings);
     }
     Core core(manifest.settings);
     forEachStimulus(manifest.settings, [&](const Stimulus& stimulus) {
@@ -246,12 +221,13 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
         ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
         for (const KeptTable& kept : format.tables) {
             for (const std::string& name : findFormat(format.name)->files(kept.table)) {
-                format.files.push_back({name, sha256(pathOf(folder, name))});
+                format.files.push_back({name, sha256(pathOf(set.aside(), name))});
             }
         }
         manifest.formats.push_back(format);
     }
-    simulation::writeAtomically(manifestIn(folder), manifestText(manifest));
+    base::writeFile(manifestIn(set.aside()), manifestText(manifest));
+    set.place();
     return manifest;
 }
 

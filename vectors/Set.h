@@ -10,8 +10,9 @@
 
 namespace morvik::vectors {
 
-/// Makes a set in a folder that is not there, is empty, or holds an earlier set, which goes. Throws simulation::Error.
-/// The manifest, whose settings, version and command are given, is written last, and returned.
+/// Makes a set in a folder that is not there, is empty, or holds an earlier set, which goes when the new one is
+/// complete. Other files stay. Throws simulation::Error. The manifest, whose settings, version and command are given,
+/// is written last, and returned.
 Manifest makeSet(const std::string& folder, Manifest manifest);
 
 /// The values that were compared with the model's, over all formats.

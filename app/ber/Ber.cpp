@@ -2,7 +2,6 @@
 #include "Ber.h"
 
 #include <algorithm>
-#include <csignal>
 #include <filesystem>
 #include <iostream>
 #include <memory>
@@ -13,9 +12,10 @@
 #include "BerOptions.h"
 #include "Interruption.h"
 #include "LiveTable.h"
+#include "Notice.h"
 #include "Pictures.h"
 #include "Text.h"
-#include "simulation/AtomicFile.h"
+#include "base/OutputFile.h"
 #include "simulation/Error.h"
 #include "simulation/Journal.h"
 #include "simulation/Replay.h"
@@ -81,15 +81,14 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
 {
     using simulation::Journal;
     const Interruption interruption;
-    std::signal(SIGXFSZ, SIG_IGN);  // a file may become too large as a disk may become full: writing tells
     Journal journal(plan,
                     options.output,
                     options.resume      ? Journal::Earlier::resume
                     : options.overwrite ? Journal::Earlier::overwrite
                                         : Journal::Earlier::refuse);
-    const Pictures pictures(options.pictures, options.output);
+    const Pictures pictures(options.pictures, options.output, {});
     if (options.resume && journal.isEmpty()) {
-        std::cerr << means.command << ": nothing to resume, starts from the beginning" << std::endl;
+        notice(means.command + ": nothing to resume, starts from the beginning");
     }
     bool isComplete = false;
     {
@@ -107,8 +106,8 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
     if (isComplete) {
         return success;
     }
-    std::cerr << means.command << ": interrupted"
-              << (options.output.empty() ? "" : ", --resume goes on from " + journal.checkpointName()) << std::endl;
+    notice(means.command + ": interrupted" +
+           (options.output.empty() ? "" : ", --resume goes on from " + journal.checkpointName()));
     return 128 + Interruption::signal();
 }
 
@@ -124,13 +123,13 @@ int replayFrame(const BerOptions& options, const simulation::Plan& plan, const R
     const std::string stem = std::filesystem::path(options.output).replace_extension().string();
     const std::string name = stem + (stem.empty() ? "" : ".") + "point" + std::to_string(replayed.point) + ".frame" +
                              std::to_string(replayed.frame);
-    simulation::writeAtomically(name + ".csv", softValues);
-    simulation::writeAtomically(name + ".bits", sentBits);
+    base::writeFile(name + ".csv", softValues);
+    base::writeFile(name + ".bits", sentBits);
 
     const simulation::Point& point = plan.points[replayed.point];
-    std::cout << wrongBits << (wrongBits == 1 ? " wrong bit\n" : " wrong bits\n") << "morvik decode " << name
-              << ".csv --reference " << name << ".bits --num-pu " << point.numPu << " --algorithm "
-              << simulation::algorithmName(point.algorithm) << " --iterations " << point.iterations << std::endl;
+    print(std::to_string(wrongBits) + (wrongBits == 1 ? " wrong bit\n" : " wrong bits\n") + "morvik decode " + name +
+          ".csv --reference " + name + ".bits --num-pu " + std::to_string(point.numPu) + " --algorithm " +
+          simulation::algorithmName(point.algorithm) + " --iterations " + std::to_string(point.iterations) + '\n');
     return success;
 }
 

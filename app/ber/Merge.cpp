@@ -44,7 +44,7 @@ std::string countOfPoints(const simulation::Results& results)
 
 int merge(const Options& options)
 {
-    const Pictures pictures(options.pictures, options.output);
+    const Pictures pictures(options.pictures, options.output, options.inputs);
     std::vector<simulation::Part> parts;
     for (const std::string& input : options.inputs) {
         parts.push_back({input, simulation::readResults(input)});

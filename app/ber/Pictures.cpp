@@ -5,10 +5,10 @@
 #include <iterator>
 #include <utility>
 
+#include "base/OutputFile.h"
 #include "report/Page.h"
 #include "report/Plot.h"
 #include "report/Reference.h"
-#include "simulation/AtomicFile.h"
 #include "simulation/Error.h"
 #include "simulation/Thousandths.h"
 
@@ -57,7 +57,7 @@ std::string rangeText(const std::vector<simulation::ResultRow>& rows)
 /// Throws Error if what is written to the one file, if any, would take the place of the other.
 void checkDistinct(const std::string& file, const std::string& other)
 {
-    if (!file.empty() && !other.empty() && simulation::isSamePlace(file, other)) {
+    if (!file.empty() && !other.empty() && base::isSamePlace(file, other)) {
         throw simulation::Error(file + ": is the same file as " + other + ", each output needs its own");
     }
 }
@@ -79,8 +79,13 @@ void addPictureOptions(CLI::App& command, PictureOptions& options)
         ->allow_extra_args(false);
 }
 
-Pictures::Pictures(const PictureOptions& options, const std::string& output) : itsOptions(options)
+Pictures::Pictures(const PictureOptions& options, const std::string& output, std::vector<std::string> inputs)
+    : itsOptions(options)
 {
+    inputs.insert(inputs.end(), options.references.begin(), options.references.end());
+    for (const std::string& file : {output, options.plot, options.report}) {
+        base::expectOwnFile(file, inputs, "results");
+    }
     for (const std::string& file : options.references) {
         std::vector<report::Curve> curves = report::readReference(file);
         std::move(curves.begin(), curves.end(), std::back_inserter(itsReferences));

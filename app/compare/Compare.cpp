@@ -9,6 +9,7 @@
 #include "Arguments.h"
 #include "DecoderOptions.h"
 #include "Files.h"
+#include "Notice.h"
 #include "OtherRuns.h"
 #include "SoftValueReader.h"
 #include "comparison/Comparison.h"
@@ -76,11 +77,7 @@ int compare(const Options& options)
     const auto otherRun = found.knownDifferent() > 0 && found.knownCompared() >= telling
                               ? findOtherRun(run, dump.values)
                               : std::optional<std::string>();
-    std::cout << comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRun})
-              << std::flush;
-    if (!std::cout) {
-        throw FileError("<stdout>", cannotBe("written"));
-    }
+    print(comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRun}));
     return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
 }
 

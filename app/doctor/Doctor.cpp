@@ -12,6 +12,7 @@
 #include "Diagnosis.h"
 #include "DiagnosisText.h"
 #include "Files.h"
+#include "Notice.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
 #include "standard/BlockSizes.h"
@@ -73,10 +74,7 @@ int examine(const Options& options)
     const Cases read = readCases(options);
     doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
     diagnosis.hasMore = read.hasMore;
-    std::cout << (options.json ? jsonOf(diagnosis) : textOf(diagnosis)) << std::flush;
-    if (!std::cout) {
-        throw FileError("<stdout>", cannotBe("written"));
-    }
+    print(options.json ? jsonOf(diagnosis) : textOf(diagnosis));
     switch (diagnosis.verdict) {
     case doctor::Verdict::healthy:
         return success;

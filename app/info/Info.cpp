@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdio>
-#include <iostream>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <optional>
@@ -13,8 +12,8 @@
 
 #include "Arguments.h"
 #include "BlockLayout.h"
-#include "Files.h"
 #include "LayoutPicture.h"
+#include "Notice.h"
 #include "report/Plot.h"
 #include "standard/BlockSizes.h"
 
@@ -213,10 +212,7 @@ std::string information(const Options& options)
 
 int inform(const Options& options)
 {
-    std::cout << information(options) << std::flush;
-    if (!std::cout) {
-        throw FileError("<stdout>", cannotBe("written"));
-    }
+    print(information(options));
     return success;
 }
 

@@ -2,12 +2,11 @@
 #include "SelfTest.h"
 
 #include <cstdio>
-#include <iostream>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <string>
 
-#include "Files.h"
+#include "Notice.h"
 #include "SelfCheck.h"
 #include "simulation/Point.h"
 
@@ -100,10 +99,7 @@ std::string jsonOf(const Findings& findings)
 int test(const Options& options)
 {
     const Findings findings = check();
-    std::cout << (options.json ? jsonOf(findings) : textOf(findings)) << std::flush;
-    if (!std::cout) {
-        throw FileError("<stdout>", cannotBe("written"));
-    }
+    print(options.json ? jsonOf(findings) : textOf(findings));
     return findings.right() ? success : differencesFound;
 }
 

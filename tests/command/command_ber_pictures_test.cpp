@@ -113,6 +113,19 @@ TEST_F(BerPictures, ThatWouldTakeThePlaceOfTheResultsEndTheRunBeforeItBegins)
                         "report.html: is the same file as results.csv, each output needs its own");
 }
 
+TEST_F(BerPictures, ThatWouldTakeThePlaceOfWhatIsReadEndTheRunBeforeItBegins)
+{
+    const std::string published = "ebn0_db,ber\n0,0.1\n";
+    morvik.write("published.csv", published);
+    std::filesystem::create_symlink("published.csv", morvik.directory() + "/curves.svg");
+    const std::string why = ": is read as published.csv, results need a file of their own\n";
+    const Arguments run = words("ber --block-size 40 --ebn0 0 --max-blocks 1 --reference published.csv");
+    EXPECT_EQ(morvik.run(run + words("--output published.csv --overwrite")).err, "morvik ber: published.csv" + why);
+    EXPECT_EQ(morvik.run(run + words("--plot curves.svg")).err, "morvik ber: curves.svg" + why);
+    EXPECT_EQ(morvik.run(words("merge published.csv --output published.csv")).err, "morvik merge: published.csv" + why);
+    EXPECT_EQ(morvik.read("published.csv"), published);
+}
+
 // ---- Of joined results
 
 class MergePictures : public BerPictures {

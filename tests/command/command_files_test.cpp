@@ -1,4 +1,9 @@
 // The command morvik and its files: which it accepts, which it refuses, and in what words.
+#include <fcntl.h>
+#include <signal.h>
+#include <unistd.h>
+
+#include <algorithm>
 #include <filesystem>
 #include <regex>
 
@@ -10,6 +15,12 @@ using namespace support;
 
 class CommandFiles : public CommandTest {
 protected:
+    /// Runs the script, to which the command is known as $0, where its files are.
+    CommandResult shell(const std::string& script) const
+    {
+        return CommandRunner("/bin/sh").run({"-c", "cd \"$1\" && " + script, morvik.program(), morvik.directory()});
+    }
+
     /// Expects that the text is refused with this line, after these decisions.
     void expectRefused(const std::string& text, const std::string& line, const std::string& decisions = "") const
     {
@@ -56,6 +67,15 @@ TEST_F(CommandFiles, AcceptsBlankLinesAtTheEnd)
 {
     const CommandResult result = decode(twoBlocks() + "\n\r\n");
     EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.out, zeroDecision + zeroDecision);
+}
+
+TEST_F(CommandFiles, AcceptsAByteOrderMarkAndBlanks)
+{
+    std::string text = "\xEF\xBB\xBF" + withLine(twoBlocks(), 1, "block, rsc1_sys,\trsc1_par ,rsc2_par ");
+    text = withLine(text, 2, " 0 , -64, -64\t,-64 ");
+    const CommandResult result = decode(text + "  \n");
+    EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_EQ(result.out, zeroDecision + zeroDecision);
 }
 
@@ -149,7 +169,7 @@ TEST_F(CommandFiles, RefusesValuesThatAreNoIntegers)
     expectRefused(withLine(twoBlocks(), 3, "0,x,1,1"), "in.csv:3: rsc1_sys \"x\"" + allowedValues);
     expectRefused(withLine(twoBlocks(), 3, "0,1,,1"), "in.csv:3: rsc1_par \"\"" + allowedValues);
     expectRefused(withLine(twoBlocks(), 3, "0,1,1,1.5"), "in.csv:3: rsc2_par \"1.5\"" + allowedValues);
-    expectRefused(withLine(twoBlocks(), 3, "0, 1,1,1"), "in.csv:3: rsc1_sys \" 1\"" + allowedValues);
+    expectRefused(withLine(twoBlocks(), 3, "0,1 2,1,1"), "in.csv:3: rsc1_sys \"1 2\"" + allowedValues);
     expectRefused(withLine(twoBlocks(), 3, "0,1,+1,1"), "in.csv:3: rsc1_par \"+1\"" + allowedValues);
     expectRefused(withLine(twoBlocks(), 3, "0,0x10,1,1"), "in.csv:3: rsc1_sys \"0x10\"" + allowedValues);
 }
@@ -256,6 +276,24 @@ TEST_F(CommandFiles, RefusesALineWithoutAnEnd)
     EXPECT_EQ(result.err, "morvik decode: /dev/zero:1: line is too long, allowed are 8192 characters\n");
 }
 
+TEST_F(CommandFiles, RefusesBlankLinesWithoutAnEnd)
+{
+    const std::string blank(10002, '\n');
+    const std::string endless = "blank lines without an end, allowed are 10000";
+    expectRefused(twoBlocks() + blank, "in.csv:90: " + endless, zeroDecision + zeroDecision);
+    expectReferenceRefused(zeroDecision + zeroDecision + blank, "ref.bits:2: " + endless);
+}
+
+TEST_F(CommandFiles, TellsHowToReadACompressedFile)
+{
+    const std::string reason = "is compressed by gzip; 'gunzip FILE' unpacks it";
+    const std::string compressed = "\x1f\x8b\x08" + std::string(9000, 'x');
+    expectRefused(compressed, "in.csv: " + reason);
+    expectReferenceRefused(compressed, "ref.bits: " + reason);
+    morvik.write("results.csv", compressed);
+    EXPECT_EQ(morvik.run({"merge", "results.csv"}).err, "morvik merge: results.csv: " + reason + '\n');
+}
+
 TEST_F(CommandFiles, AllowsLinesUpToTheLongestLength)
 {
     const std::string longLabel(8192 - 12, '1');
@@ -309,6 +347,125 @@ TEST_F(CommandFiles, NeverOverwritesWhatItReads)
     const CommandResult reference = decode(twoBlocks(), {"--reference", "ref.bits", "--output", "ref.bits"});
     EXPECT_EQ(reference.status, 2);
     EXPECT_EQ(morvik.read("ref.bits"), zeroDecision + zeroDecision);
+}
+
+TEST_F(CommandFiles, NeverOverwritesWhatItReadsUnderAnotherName)
+{
+    morvik.write("in.csv", twoBlocks());
+    std::filesystem::create_symlink("in.csv", morvik.directory() + "/soft.csv");
+    std::filesystem::create_hard_link(morvik.directory() + "/in.csv", morvik.directory() + "/hard.csv");
+    for (const std::string name : {"in.csv", "soft.csv", "hard.csv"}) {
+        const CommandResult result = morvik.run({"decode", "--output", name}, "in.csv");
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.err,
+                  "morvik decode: " + name + ": is read as <stdin>, the decisions need a file of their own\n");
+        EXPECT_EQ(morvik.read("in.csv"), twoBlocks());
+    }
+    const CommandResult appended = shell("\"$0\" decode in.csv >>in.csv");
+    EXPECT_EQ(appended.status, 2);
+    EXPECT_EQ(appended.err, "morvik decode: <stdout>: is read as in.csv, the decisions need a file of their own\n");
+    EXPECT_EQ(morvik.read("in.csv"), twoBlocks());
+}
+
+TEST_F(CommandFiles, NeverPrintsIntoAFileInThePlaceOfAClosedStream)
+{
+    morvik.write("in.csv", twoBlocks());
+    const CommandResult output = shell("\"$0\" decode in.csv --trace 1 --output decided.bits >&-");
+    EXPECT_EQ(output.status, 2);
+    EXPECT_EQ(output.err, "morvik decode: <stdout>: cannot be written with the decoder's messages\n");
+    EXPECT_EQ(morvik.read("decided.bits"), zeroDecision);
+
+    EXPECT_EQ(shell("\"$0\" decode in.csv --output decided.bits 2>&-").status, 0);
+    EXPECT_EQ(morvik.read("decided.bits"), zeroDecision + zeroDecision);
+    EXPECT_EQ(shell("\"$0\" decode in.csv --output decided.bits <&- >&- 2>&-").status, 0);
+    EXPECT_EQ(morvik.read("decided.bits"), zeroDecision + zeroDecision);
+
+    EXPECT_EQ(shell("\"$0\" decode in.csv >&-").err,
+              "morvik decode: <stdout>: cannot be written: Bad file descriptor\n");
+    EXPECT_EQ(shell("\"$0\" decode <&-").err, "morvik decode: <stdin>:1: cannot be read: Bad file descriptor\n");
+    for (const std::string what : {"--help", "--version", "decode --help", "info 40"}) {
+        EXPECT_EQ(shell("\"$0\" " + what + " >&-").status, 2) << what;
+    }
+}
+
+TEST_F(CommandFiles, TellsWhatCannotBePrinted)
+{
+    const std::vector<std::string> replay = {"ber", "--block-size", "40", "--ebn0", "1", "--replay", "0:1"};
+    const std::vector<std::vector<std::string>> all = {{"--help"},
+                                                       {"--version"},
+                                                       {"ber", "--help"},
+                                                       replay,
+                                                       {"info"},
+                                                       {"vectors", "--out", "set", "--block-size", "40"}};
+    for (const std::vector<std::string>& arguments : all) {
+        const CommandResult result = morvik.run(arguments, "/dev/null", "/dev/full");
+        EXPECT_EQ(result.status, 2) << arguments.front();
+        EXPECT_NE(result.err.find(": <stdout>: cannot be written: No space left on device\n"), std::string::npos)
+            << arguments.front() << ": " << result.err;
+    }
+}
+
+TEST_F(CommandFiles, WritesThroughTheNameOfStandardOutput)
+{
+    morvik.write("in.csv", twoBlocks());
+    const CommandResult result =
+        shell("(echo before; \"$0\" decode in.csv --trace 1 --output /dev/stdout; echo after) >all.txt");
+    EXPECT_EQ(morvik.read("all.txt"), "before\n" + zeroDecision + zeroDecision + "after\n");
+    EXPECT_NE(result.err.find(" siso=0"), std::string::npos) << "not between the decisions";
+}
+
+TEST_F(CommandFiles, LeavesTheOldOutputWhenItIsKilled)
+{
+    morvik.write("decided.bits", "precious");
+    morvik.write("decided.bits.unfinished", "precious, too");
+    const std::vector<std::string> names = morvik.names();
+    int input[2];
+    int trace[2];
+    ASSERT_EQ(pipe2(input, O_CLOEXEC), 0);
+    ASSERT_EQ(pipe2(trace, O_CLOEXEC), 0);
+    const int streams[] = {input[0], trace[1], trace[1]};
+    Process process(
+        morvik.program(), {"decode", "--trace", "1", "--output", "decided.bits"}, morvik.directory(), streams);
+    close(input[0]);
+    close(trace[1]);
+    const std::string text = header + '\n' + zeroRows("0", 44) + zeroRows("1", 1);
+    EXPECT_EQ(write(input[1], text.data(), text.size()), static_cast<ssize_t>(text.size()));
+    char begun = 0;
+    EXPECT_EQ(read(trace[0], &begun, 1), 1);
+    process.send(SIGKILL);
+    EXPECT_EQ(process.wait(), -SIGKILL);
+    close(input[1]);
+    close(trace[0]);
+    EXPECT_EQ(morvik.names(), names);
+    EXPECT_EQ(morvik.read("decided.bits"), "precious");
+    EXPECT_EQ(morvik.read("decided.bits.unfinished"), "precious, too");
+}
+
+TEST_F(CommandFiles, KeepsTerminalsFromWhatNamesBring)
+{
+    const std::string wild =
+        "a\x1b]0;title\x07\n\x9b"
+        "1m";
+    const std::string shown = "a\\x1b]0;title\\x07\\x0a\\x9b1m";
+    EXPECT_EQ(morvik.run({"decode", wild}).err,
+              "morvik decode: " + shown + ": cannot be opened: No such file or directory\n");
+    const std::vector<std::vector<std::string>> all = {{wild},
+                                                       {"decode", "--" + wild},
+                                                       {"decode", "one", wild},
+                                                       {"decode", "--num-pu", wild},
+                                                       {"decode", vectors("k40.csv"), "--output", wild + "/x"},
+                                                       {"merge", wild},
+                                                       {"vectors", "--check", wild},
+                                                       {"ber", "--block-size", "40", "--reference", wild},
+                                                       {"compare", "--block", wild, "--dump", wild}};
+    for (const std::vector<std::string>& arguments : all) {
+        const CommandResult result = morvik.run(arguments);
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.err.find_first_of("\x1b\x07\x9b"), std::string::npos) << arguments.front();
+        EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1) << result.err;
+    }
+    const CommandResult made = morvik.run({"vectors", "--out", wild, "--block-size", "40", "--blocks", "1"});
+    EXPECT_EQ(made.out.rfind(shown + ": ", 0), 0U) << made.out;
 }
 
 TEST_F(CommandFiles, LeavesTheOutputAloneWhenTheHeaderIsWrong)

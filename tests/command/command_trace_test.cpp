@@ -283,7 +283,7 @@ TEST_F(CommandTrace, RefusesWhatIsNotAllowed)
     const std::string own = "--signals and --units need --format csv, vcd or npy: the text is the library's own";
     expectRefused({k40, "--units", "0"}, own);
     expectRefused({k40, "--signals", "llr"}, own);
-    expectRefused({k40, "--format", "npy"}, "--format npy needs --output FILE");
+    expectRefused({k40, "--format", "npy"}, "--format npy needs a regular file, by --output FILE");
 }
 
 TEST_F(CommandTrace, TellsWhatIsWrongWithFiles)
@@ -305,7 +305,8 @@ TEST_F(CommandTrace, TellsWhatIsWrongWithFiles)
         expectRefused({"in.csv", "--format", format, "--output", "nowhere/out"},
                       "nowhere/out: cannot be written: No such file or directory");
         expectRefused({"in.csv", "--format", format, "--output", "/dev/full"},
-                      "/dev/full: cannot be written: No space left on device");
+                      format == "npy" ? "--format npy needs a regular file, by --output FILE"
+                                      : "/dev/full: cannot be written: No space left on device");
     }
     for (const std::string format : {"text", "csv", "vcd"}) {
         const CommandResult result = trace({"in.csv", "--format", format}, "/dev/full");

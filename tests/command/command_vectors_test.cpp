@@ -156,7 +156,7 @@ TEST_F(CommandVectors, ReportsAFullDisk)
     const CommandResult result =
         morvik.run({"vectors", "--out", "set", "--block-size", "40"}, "/dev/null", "/dev/full");
     EXPECT_EQ(result.status, 2);
-    EXPECT_EQ(result.err, "morvik vectors: <stdout>: cannot be written\n");
+    EXPECT_EQ(result.err, "morvik vectors: <stdout>: cannot be written: No space left on device\n");
 }
 
 }  // namespace

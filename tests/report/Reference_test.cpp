@@ -47,6 +47,15 @@ Curve readOnly(const std::string& name)
     return curves.at(0);
 }
 
+TEST_F(Reference, MayHaveAByteOrderMark)
+{
+    const std::vector<Curve> curves = read(
+        "\xEF\xBB\xBF"
+        "ebn0_db, ber\n1, 0.5\n");
+    ASSERT_EQ(curves.size(), 1U);
+    EXPECT_EQ(curves[0].samples.at(0).ber, 0.5);
+}
+
 TEST_F(Reference, ReadsPublishedErrorRates)
 {
     const Curve curve = readOnly("aff3ct_lte_k6144_i6_float32");

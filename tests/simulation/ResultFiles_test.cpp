@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <filesystem>
 #include <nlohmann/json.hpp>
 
 #include "simulation/Error.h"
@@ -166,6 +167,30 @@ TEST_F(ResultFiles, WithImpossibleCountsAreRefused)
     EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",5:281474976710662,281474976710657,")), cannotBe);
     EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",5:281474976710661,281474976710656,")), "none");
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,28,")), "none");
+}
+
+TEST_F(ResultFiles, MayHaveAByteOrderMarkAndBlanks)
+{
+    std::string text = csvText(exampleResults());
+    for (std::size_t comma = text.find(','); comma != std::string::npos; comma = text.find(',', comma + 2)) {
+        text.replace(comma, 1, " ,\t");
+    }
+    folder.write("a.csv", "\xEF\xBB\xBF" + text);
+    EXPECT_EQ(csvText(readResults(folder.path("a.csv"))), csvText(exampleResults()));
+    folder.write("a.json", "\xEF\xBB\xBF" + jsonText(exampleResults()));
+    EXPECT_EQ(jsonText(readResults(folder.path("a.json"))), jsonText(exampleResults()));
+}
+
+TEST_F(ResultFiles, ThatAreNoTextAreRefused)
+{
+    EXPECT_EQ(refusal("a.csv", "\x1f\x8b\x08..."), "a.csv: is compressed by gzip; 'gunzip FILE' unpacks it");
+    std::filesystem::create_symlink("/dev/zero", folder.path("endless.csv"));
+    try {
+        readResults(folder.path("endless.csv"));
+        FAIL() << "accepted";
+    } catch (const Error& error) {
+        EXPECT_EQ(error.what(), folder.path("endless.csv") + ": is no text, it has a null character");
+    }
 }
 
 TEST_F(ResultFiles, OfBrokenJsonAreRefused)

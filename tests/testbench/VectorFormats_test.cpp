@@ -152,6 +152,15 @@ TEST(VectorFormats, NpyIsOfVersionOne)
               "{'descr': '|u1', 'fortran_order': False, 'shape': (3,), }    ");
 }
 
+TEST(VectorFormats, CsvMayHaveAByteOrderMarkAndBlanks)
+{
+    const support::TemporaryFolder folder;
+    folder.write("bits.csv",
+                 "\xEF\xBB\xBF"
+                 "block , bit\r\n 0 ,\t1 \r\n0,0\n");
+    EXPECT_EQ(read(*findFormat("csv"), folder.path(), bits), (std::vector<Row>{{1}, {0}}));
+}
+
 // ---- What they refuse
 
 TEST(VectorFormats, MemhNamesThePlace)

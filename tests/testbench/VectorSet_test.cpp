@@ -10,9 +10,11 @@
 #include <vector>
 
 #include "simulation/Error.h"
+#include "support/SmallFiles.h"
 #include "support/TemporaryFolder.h"
 #include "vectors/Checksum.h"
 #include "vectors/Set.h"
+#include "vectors/SetFolder.h"
 
 namespace {
 
@@ -88,6 +90,18 @@ protected:
         return checkSet(path()).difference.value_or("none");
     }
 
+    /// All that is in the folder, hidden or not.
+    std::vector<std::string> names() const
+    {
+        std::vector<std::string> names;
+        for (const auto& entry : std::filesystem::directory_iterator(path())) {
+            names.push_back(entry.path().filename());
+        }
+        std::sort(names.begin(), names.end());
+        return names;
+    }
+
+    const std::vector<std::string> ofCsv = {"blocks.csv", "expected.csv", "manifest.json", "stimulus.csv"};
     support::TemporaryFolder folder;
     Settings settings;
 };
@@ -174,13 +188,119 @@ TEST_F(VectorSet, TakesThePlaceOfAnEarlierOne)
     settings.internal = false;
     make();
     EXPECT_EQ(difference(), "none");
-    const std::vector<std::string> left = {"blocks.csv", "expected.csv", "manifest.json", "stimulus.csv"};
-    std::vector<std::string> names;
-    for (const auto& entry : std::filesystem::directory_iterator(path())) {
-        names.push_back(entry.path().filename());
+    EXPECT_EQ(names(), ofCsv);
+}
+
+TEST_F(VectorSet, LeavesTheEarlierOneWhenTheDiskIsFull)
+{
+    settings.formats = {"csv"};
+    settings.ratios = settings.internal = false;
+    make();
+    const std::string manifest = read("manifest.json");
+    folder.write("set/mine.txt", "x");
+    settings.blockSizes = {6144};
+    {
+        const support::SmallFiles small(20000);
+        EXPECT_THROW(make(), simulation::Error);
     }
-    std::sort(names.begin(), names.end());
-    EXPECT_EQ(names, left);
+    EXPECT_EQ(read("manifest.json"), manifest);
+    EXPECT_EQ(difference(), "none");
+    EXPECT_EQ(read("mine.txt"), "x");
+    EXPECT_EQ(names().size(), ofCsv.size() + 1) << "nothing else is left";
+}
+
+TEST_F(VectorSet, LeavesNoFolderWhereItCouldNotBeMade)
+{
+    const support::SmallFiles small(100);
+    EXPECT_THROW(make(), simulation::Error);
+    EXPECT_FALSE(std::filesystem::exists(path()));
+}
+
+TEST_F(VectorSet, LeavesFilesOfOthersAlone)
+{
+    settings.formats = {"csv"};
+    settings.ratios = settings.internal = false;
+    make();
+    folder.write("set/mine.txt", "x");
+    std::filesystem::create_directory(path() + "/work");
+    settings.blocks = 1;
+    make();
+    EXPECT_EQ(read("mine.txt"), "x");
+    EXPECT_EQ(names().size(), ofCsv.size() + 2);
+    EXPECT_EQ(difference(), "none");
+
+    folder.write("set/stimulus.npy", "mine, too");
+    settings.formats = {"npy"};
+    try {
+        make();
+        FAIL() << "accepted";
+    } catch (const simulation::Error& error) {
+        EXPECT_EQ(error.what(),
+                  path() + "/stimulus.npy: is no file of the earlier set, and the new one has such a file");
+    }
+    EXPECT_EQ(read("stimulus.npy"), "mine, too");
+}
+
+TEST_F(VectorSet, IsMadeByOneProcessAtATime)
+{
+    settings.formats = {"csv"};
+    settings.ratios = settings.internal = false;
+    {
+        const morvik::vectors::SetFolder other(path());
+        try {
+            make();
+            FAIL() << "accepted";
+        } catch (const simulation::Error& error) {
+            EXPECT_EQ(
+                error.what(),
+                path() + ": another process is making a set in it; wait for that to end, or choose another folder");
+        }
+        EXPECT_TRUE(std::filesystem::exists(other.aside()));
+    }
+    EXPECT_FALSE(std::filesystem::exists(path()));
+    make();
+    EXPECT_EQ(names(), ofCsv);
+}
+
+TEST_F(VectorSet, IsMadeWhereAProcessWasKilled)
+{
+    settings.formats = {"csv"};
+    settings.ratios = settings.internal = false;
+    make();
+    std::filesystem::create_directory(path() + "/.morvik-unfinished");
+    folder.write("set/.morvik-unfinished/lock", "");
+    folder.write("set/.morvik-unfinished/blocks.csv", "half of");
+    EXPECT_EQ(difference(), "none");
+    make();
+    EXPECT_EQ(names(), ofCsv);
+    EXPECT_EQ(difference(), "none");
+}
+
+TEST_F(VectorSet, IsCompleteWhereAProcessWasKilledWhileItPlacedOne)
+{
+    settings.ratios = settings.internal = false;
+    settings.formats = {"memh"};
+    make();
+    std::filesystem::rename(path(), folder.path("earlier"));
+    settings.formats = {"csv"};
+    make();
+    const std::string manifest = read("manifest.json");
+
+    // The earlier manifest has gone aside, one of the earlier files is removed, and one of the new ones placed.
+    const std::string aside = path() + "/.morvik-unfinished";
+    std::filesystem::create_directory(aside);
+    for (const char* const file : {"manifest.json", "expected.csv", "stimulus.csv"}) {
+        std::filesystem::rename(path() + '/' + file, aside + '/' + file);
+    }
+    std::filesystem::rename(folder.path("earlier/manifest.json"), aside + "/earlier.json");
+    std::filesystem::rename(folder.path("earlier/expected.memh"), path() + "/expected.memh");
+    std::filesystem::rename(folder.path("earlier/stimulus.memh"), path() + "/stimulus.memh");
+    {
+        const morvik::vectors::SetFolder next(path());
+    }
+    EXPECT_EQ(names(), ofCsv);
+    EXPECT_EQ(read("manifest.json"), manifest);
+    EXPECT_EQ(difference(), "none");
 }
 
 TEST_F(VectorSet, LeavesOtherFoldersAlone)

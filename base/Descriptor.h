@@ -1,6 +1,6 @@
 // Descriptor: an open file of the operating system.
-#ifndef MORVIK_SIMULATION_DESCRIPTOR_H
-#define MORVIK_SIMULATION_DESCRIPTOR_H
+#ifndef MORVIK_BASE_DESCRIPTOR_H
+#define MORVIK_BASE_DESCRIPTOR_H
 
 #include <sys/file.h>
 #include <sys/stat.h>
@@ -11,7 +11,7 @@
 #include <string_view>
 #include <utility>
 
-namespace simulation {
+namespace base {
 
 /// An open file, closed at the end of its life.
 class Descriptor {
@@ -35,6 +35,11 @@ public:
     bool isOpen() const
     {
         return itsNumber >= 0;
+    }
+
+    int number() const
+    {
+        return itsNumber;
     }
 
     bool write(std::string_view content) const
@@ -85,6 +90,6 @@ private:
     int itsNumber;
 };
 
-}  // namespace simulation
+}  // namespace base
 
 #endif

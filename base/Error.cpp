@@ -1,14 +1,14 @@
-// Error: what a simulation cannot go on with.
+// Error: what a program cannot go on with.
 #include "Error.h"
 
 #include <cerrno>
 #include <system_error>
 
-namespace simulation {
+namespace base {
 
 Error fileError(const std::string& file, const std::string& action)
 {
     return Error(file + ": cannot be " + action + ": " + std::generic_category().message(errno));
 }
 
-}  // namespace simulation
+}  // namespace base

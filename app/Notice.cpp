@@ -1,0 +1,23 @@
+// Notice: what a command tells beside its results.
+#include "Notice.h"
+
+#include <iostream>
+
+#include "Files.h"
+#include "base/Printable.h"
+
+namespace morvik {
+
+void notice(const std::string& line)
+{
+    std::cerr << base::visible(line) << std::endl;
+}
+
+void print(const std::string& text)
+{
+    if (!(std::cout << base::visibleLines(text) << std::flush)) {
+        throw FileError("<stdout>", cannotBe("written"));
+    }
+}
+
+}  // namespace morvik

@@ -1,0 +1,284 @@
+// OutputFile: the one way in which files are written.
+#include "OutputFile.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <cerrno>
+#include <charconv>
+#include <cstdio>
+#include <filesystem>
+#include <iostream>
+#include <optional>
+#include <system_error>
+#include <utility>
+
+#include "Error.h"
+
+namespace base {
+
+namespace {
+
+/// As many links behind each other as Linux follows.
+constexpr int mostLinks = 40;
+
+constexpr std::size_t bufferSize = 65536;
+
+constexpr mode_t permissions = S_IRWXU | S_IRWXG | S_IRWXO;
+
+/// What a name leads to over links: a path, whether there is something or not, or an open descriptor of this process.
+struct Place {
+    std::string path;
+    std::optional<int> descriptor;
+};
+
+/// The descriptor that has such a name: a link of which nobody can tell where it leads.
+std::optional<int> descriptorNamed(std::string_view path)
+{
+    for (const std::string_view folder : {"/dev/fd/", "/proc/self/fd/"}) {
+        int number = 0;
+        const char* const end = path.data() + path.size();
+        if (path.substr(0, folder.size()) == folder) {
+            const auto result = std::from_chars(path.data() + folder.size(), end, number);
+            return result.ec == std::errc() && result.ptr == end ? std::optional<int>(number) : std::nullopt;
+        }
+    }
+    return std::nullopt;
+}
+
+Place placeOf(const std::string& name)
+{
+    if (name == standardStream) {
+        return {{}, STDOUT_FILENO};
+    }
+    std::filesystem::path path = name;
+    for (int links = 0; links <= mostLinks; ++links) {
+        std::error_code none;  // of a link
+        const auto descriptor = descriptorNamed(path.string());
+        const std::filesystem::path next = descriptor ? path : std::filesystem::read_symlink(path, none);
+        if (descriptor || none) {
+            return {path.string(), descriptor};
+        }
+        path = path.parent_path() / next;
+    }
+    errno = ELOOP;
+    throw fileError(name, "written");
+}
+
+std::string folderOf(const std::string& place)
+{
+    const std::filesystem::path folder = std::filesystem::path(place).parent_path();
+    return folder.empty() ? "." : folder.string();
+}
+
+/// A name in the folder that nobody else uses or would give.
+std::string temporaryName(const std::string& folder)
+{
+    static std::atomic<unsigned> count{0};
+    return folder + "/.morvik-" + std::to_string(getpid()) + '-' + std::to_string(count++);
+}
+
+/// The name by which the system knows an open file of this process.
+std::string nameOf(const Descriptor& file)
+{
+    return "/proc/self/fd/" + std::to_string(file.number());
+}
+
+}  // namespace
+
+OutputFile::OutputFile(const std::string& name) : itsName(name == standardStream ? "<stdout>" : name), itsFile(-1)
+{
+    const Place place = placeOf(name);
+    struct stat old = {};
+    if (place.descriptor) {
+        std::cout.flush();  // what has been printed stands before this
+        itsFile = Descriptor(fcntl(*place.descriptor, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
+        itsIsStandardOutput = place.descriptor == STDOUT_FILENO;
+    } else if (stat(place.path.c_str(), &old) != 0) {
+        constexpr mode_t anybody = S_IRUSR | S_IWUSR | S_IRGRP | S_IWGRP | S_IROTH | S_IWOTH;
+        if (errno == ENOENT && !name.empty()) {
+            openNew(place.path, anybody);
+        }
+    } else if (!S_ISREG(old.st_mode)) {
+        itsFile = Descriptor(open(place.path.c_str(), O_WRONLY | O_NOCTTY | O_CLOEXEC));
+    } else if (access(place.path.c_str(), W_OK) == 0) {
+        openNew(place.path, old.st_mode & permissions);
+        itsFile.allow(old.st_mode & permissions);  // not every file system can; it has no more of them in any case
+    }
+    if (!itsFile.isOpen()) {
+        fail();
+    }
+}
+
+OutputFile::~OutputFile()
+{
+    if (itsFile.isOpen() && !itsTemporary.empty()) {
+        const int reason = errno;
+        unlink(itsTemporary.c_str());
+        errno = reason;
+    }
+}
+
+bool OutputFile::isStandardOutput() const
+{
+    return itsIsStandardOutput;
+}
+
+bool OutputFile::isReplaced() const
+{
+    return !itsPlace.empty();
+}
+
+void OutputFile::write(std::string_view text)
+{
+    if (itsText.size() + text.size() > bufferSize) {
+        writeOut(itsText);
+        itsText.clear();
+    }
+    if (text.size() > bufferSize) {
+        writeOut(text);
+    } else {
+        itsText += text;
+    }
+}
+
+void OutputFile::overwriteStart(std::string_view text)
+{
+    writeOut(std::exchange(itsText, {}));
+    if (!isReplaced()) {
+        errno = ESPIPE;
+        fail();
+    }
+    if (pwrite(itsFile.number(), text.data(), text.size(), 0) != static_cast<ssize_t>(text.size())) {
+        fail();
+    }
+}
+
+void OutputFile::flush()
+{
+    if (!isReplaced()) {
+        writeOut(itsText);
+        itsText.clear();
+    }
+}
+
+void OutputFile::lock() const
+{
+    itsFile.lock();
+}
+
+void OutputFile::secure()
+{
+    itsIsSecured = true;
+}
+
+Descriptor OutputFile::commit()
+{
+    writeOut(std::exchange(itsText, {}));
+    if (isReplaced()) {
+        if ((itsIsSecured && !itsFile.sync()) || !nameNew() || rename(itsTemporary.c_str(), itsPlace.c_str()) != 0) {
+            fail();
+        }
+        itsTemporary.clear();
+        if (itsIsSecured) {
+            Descriptor(open(folderOf(itsPlace).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC))
+                .sync();  // the new name, too
+        }
+    }
+    return std::move(itsFile);
+}
+
+/// Where the file system and the system allow, the new file has no name, and goes with the process however that ends.
+void OutputFile::openNew(const std::string& place, mode_t mode)
+{
+    itsPlace = place;
+    const std::string folder = folderOf(itsPlace);
+    itsFile = Descriptor(open(folder.c_str(), O_TMPFILE | O_WRONLY | O_CLOEXEC, mode));
+    if (itsFile.isOpen() && access(nameOf(itsFile).c_str(), F_OK) == 0) {
+        return;
+    }
+    do {
+        itsTemporary = temporaryName(folder);
+        itsFile = Descriptor(open(itsTemporary.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode));
+    } while (!itsFile.isOpen() && errno == EEXIST);
+}
+
+/// A file without a name cannot take the place of another at once.
+bool OutputFile::nameNew()
+{
+    if (!itsTemporary.empty()) {
+        return true;
+    }
+    int failure = 0;
+    std::string name;
+    do {
+        name = temporaryName(folderOf(itsPlace));
+        failure = linkat(AT_FDCWD, nameOf(itsFile).c_str(), AT_FDCWD, name.c_str(), AT_SYMLINK_FOLLOW);
+    } while (failure != 0 && errno == EEXIST);
+    if (failure == 0) {
+        itsTemporary = name;
+    }
+    return failure == 0;
+}
+
+void OutputFile::writeOut(std::string_view text) const
+{
+    if (!itsFile.write(text)) {
+        fail();
+    }
+}
+
+void OutputFile::fail() const
+{
+    throw fileError(itsName, "written");
+}
+
+void writeFile(const std::string& name, std::string_view content)
+{
+    OutputFile file(name);
+    file.secure();
+    file.write(content);
+    file.commit();
+}
+
+void checkWritable(const std::string& name)
+{
+    struct stat old = {};
+    if (placeOf(name).descriptor || (stat(name.c_str(), &old) == 0 && !S_ISREG(old.st_mode))) {
+        throw Error(name + ": is no regular file, results need one");
+    }
+    OutputFile{name};
+}
+
+void expectOwnFile(const std::string& name, const std::vector<std::string>& inputs, const std::string& content)
+{
+    const auto find = [](const std::string& file, int stream, struct stat& found) {
+        return (file == standardStream ? fstat(stream, &found) : stat(file.c_str(), &found)) == 0;
+    };
+    struct stat output = {};
+    if (!find(name, STDOUT_FILENO, output) || !S_ISREG(output.st_mode)) {
+        return;
+    }
+    for (const std::string& each : inputs) {
+        struct stat input = {};
+        if (find(each, STDIN_FILENO, input) && input.st_dev == output.st_dev && input.st_ino == output.st_ino) {
+            const auto shown = [](const std::string& file, const char* stream) {
+                return file == standardStream ? stream : file;
+            };
+            throw Error(shown(name, "<stdout>") + ": is read as " + shown(each, "<stdin>") + ", " + content +
+                        " need a file of their own");
+        }
+    }
+}
+
+bool isSamePlace(const std::string& a, const std::string& b)
+{
+    const auto whole = [](const std::string& name) {
+        return std::filesystem::weakly_canonical(std::filesystem::absolute(placeOf(name).path));
+    };
+    return whole(a) == whole(b);
+}
+
+}  // namespace base

@@ -1,0 +1,263 @@
+// OutputFile: files are replaced as a whole, or not at all; what is no regular file is written to.
+#include "base/OutputFile.h"
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <filesystem>
+
+#include "base/Error.h"
+#include "support/SmallFiles.h"
+#include "support/TemporaryFolder.h"
+
+namespace {
+
+using base::checkWritable;
+using base::Error;
+using base::expectOwnFile;
+using base::isSamePlace;
+using base::writeFile;
+
+std::string refusal(const std::string& file, const std::string& content)
+{
+    try {
+        writeFile(file, content);
+    } catch (const Error& error) {
+        return error.what();
+    }
+    return "none";
+}
+
+/// Hidden files, too.
+std::vector<std::string> everythingIn(const support::TemporaryFolder& folder)
+{
+    std::vector<std::string> names;
+    for (const auto& entry : std::filesystem::directory_iterator(folder.path())) {
+        names.push_back(entry.path().filename());
+    }
+    return names;
+}
+
+class OutputFile : public testing::Test {
+protected:
+    const support::TemporaryFolder folder;
+    const std::string file = folder.path("file.csv");
+};
+
+using Names = std::vector<std::string>;
+
+TEST_F(OutputFile, IsMade)
+{
+    writeFile(file, "content\n");
+    EXPECT_EQ(folder.read("file.csv"), "content\n");
+    EXPECT_EQ(folder.names(), Names{"file.csv"});
+}
+
+TEST_F(OutputFile, ReplacesAnotherWithItsPermissions)
+{
+    folder.write("file.csv", "a longer content that was there before\n");
+    ASSERT_EQ(chmod(file.c_str(), 0640), 0);
+    writeFile(file, "");
+    EXPECT_EQ(folder.read("file.csv"), "");
+    struct stat status = {};
+    ASSERT_EQ(stat(file.c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 0777, 0640U);
+    EXPECT_EQ(folder.names(), Names{"file.csv"});
+}
+
+TEST_F(OutputFile, IsAnotherFileThanTheOneThatAReaderHasOpen)
+{
+    folder.write("file.csv", "old\n");
+    std::filesystem::create_hard_link(file, folder.path("kept"));
+    writeFile(file, "new\n");
+    EXPECT_EQ(folder.read("kept"), "old\n");
+    EXPECT_EQ(folder.read("file.csv"), "new\n");
+}
+
+TEST_F(OutputFile, FollowsALink)
+{
+    std::filesystem::create_directory(folder.path("elsewhere"));
+    folder.write("elsewhere/file.csv", "old\n");
+    std::filesystem::create_symlink("elsewhere/file.csv", file);
+    writeFile(file, "new\n");
+    EXPECT_TRUE(std::filesystem::is_symlink(file));
+    EXPECT_EQ(folder.read("elsewhere/file.csv"), "new\n");
+}
+
+TEST_F(OutputFile, FollowsLinksToAFileThatIsNotThereYet)
+{
+    std::filesystem::create_directory(folder.path("elsewhere"));
+    std::filesystem::create_symlink("elsewhere/link.csv", file);
+    std::filesystem::create_symlink("file.csv", folder.path("elsewhere/link.csv"));
+    checkWritable(file);
+    writeFile(file, "new\n");
+    EXPECT_TRUE(std::filesystem::is_symlink(file));
+    EXPECT_EQ(folder.read("elsewhere/file.csv"), "new\n");
+}
+
+TEST_F(OutputFile, IsRefusedWhereALinkLeadsNowhere)
+{
+    std::filesystem::create_symlink("file.csv", file);
+    EXPECT_EQ(refusal(file, ""), file + ": cannot be written: Too many levels of symbolic links");
+    EXPECT_THROW(checkWritable(file), Error);
+    EXPECT_TRUE(std::filesystem::is_symlink(file));
+}
+
+TEST_F(OutputFile, IsTheSamePlaceUnderAllOfItsNames)
+{
+    std::filesystem::create_symlink("file.csv", folder.path("link.svg"));
+    std::filesystem::create_directory(folder.path("sub"));
+    for (const char* state : {"is not there", "is there"}) {
+        SCOPED_TRACE(state);
+        EXPECT_TRUE(isSamePlace(file, folder.path("link.svg")));
+        EXPECT_TRUE(isSamePlace(file, folder.path("sub/../file.csv")));
+        EXPECT_FALSE(isSamePlace(file, folder.path("other.csv")));
+        EXPECT_FALSE(isSamePlace(file, folder.path("sub/file.csv")));
+        folder.write("file.csv", "");
+    }
+}
+
+TEST_F(OutputFile, LeavesFilesOfOtherNamesAlone)
+{
+    folder.write("file.csv.unfinished", "the user's own");
+    writeFile(file, "new\n");
+    EXPECT_EQ(folder.read("file.csv"), "new\n");
+    EXPECT_EQ(folder.read("file.csv.unfinished"), "the user's own");
+}
+
+TEST_F(OutputFile, HasItsNameWhenItIsComplete)
+{
+    folder.write("file.csv", "old\n");
+    {
+        base::OutputFile output(file);
+        output.write("lost\n");
+    }
+    EXPECT_EQ(folder.read("file.csv"), "old\n");
+    base::OutputFile output(file);
+    output.write(std::string(100000, 'x'));
+    base::OutputFile moved(std::move(output));
+    moved.write("end");
+    moved.overwriteStart("start");
+    moved.flush();
+    EXPECT_EQ(folder.read("file.csv"), "old\n");
+    moved.commit();
+    EXPECT_EQ(folder.read("file.csv"), "start" + std::string(99995, 'x') + "end");
+    EXPECT_EQ(everythingIn(folder), Names{"file.csv"});
+}
+
+TEST_F(OutputFile, LetsNobodyRunItAsAnother)
+{
+    folder.write("file.csv", "old\n");
+    ASSERT_EQ(chmod(file.c_str(), 07755), 0);
+    writeFile(file, "new\n");
+    struct stat status = {};
+    ASSERT_EQ(stat(file.c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 07777, 0755U);
+}
+
+TEST_F(OutputFile, IsWrittenToWhereItIsAPipe)
+{
+    ASSERT_EQ(mkfifo(file.c_str(), 0600), 0);
+    const base::Descriptor reader(open(file.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+    base::OutputFile output(file);
+    EXPECT_FALSE(output.isReplaced());
+    output.write("one\n");
+    output.flush();
+    char text[16] = {};
+    EXPECT_EQ(read(reader.number(), text, sizeof text), 4);
+    EXPECT_STREQ(text, "one\n");
+    EXPECT_THROW(output.overwriteStart("x"), Error);
+    EXPECT_TRUE(std::filesystem::is_fifo(file));
+}
+
+TEST_F(OutputFile, IsWrittenToWhereItIsADevice)
+{
+    writeFile("/dev/null", "x");
+    EXPECT_EQ(refusal("/dev/full", "x"), "/dev/full: cannot be written: No space left on device");
+    EXPECT_TRUE(std::filesystem::is_character_file("/dev/null"));
+    EXPECT_TRUE(std::filesystem::is_character_file("/dev/full"));
+}
+
+TEST_F(OutputFile, IsWrittenToWhereItIsAnOpenDescriptor)
+{
+    const base::Descriptor opened(open(file.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600));
+    ASSERT_TRUE(opened.write("before\n"));
+    std::filesystem::create_symlink("/dev/fd/" + std::to_string(opened.number()), folder.path("link"));
+    writeFile(folder.path("link"), "between\n");
+    ASSERT_TRUE(opened.write("after\n"));
+    EXPECT_EQ(folder.read("file.csv"), "before\nbetween\nafter\n");
+    EXPECT_THROW(checkWritable(folder.path("link")), Error);
+    EXPECT_THROW(writeFile("/dev/fd/999", ""), Error);
+}
+
+TEST_F(OutputFile, IsNoneOfTheInputs)
+{
+    folder.write("file.csv", "");
+    std::filesystem::create_hard_link(file, folder.path("hard"));
+    std::filesystem::create_symlink("file.csv", folder.path("soft"));
+    const auto refused = [&](const std::string& name, const std::vector<std::string>& inputs) -> std::string {
+        try {
+            expectOwnFile(name, inputs, "results");
+        } catch (const Error& error) {
+            return error.what();
+        }
+        return "none";
+    };
+    for (const char* const name : {"hard", "soft", "file.csv"}) {
+        const std::string output = folder.path(name);
+        EXPECT_EQ(refused(output, {"missing", file}),
+                  output + ": is read as " + file + ", results need a file of their own");
+    }
+    EXPECT_EQ(refused(file, {folder.path("other"), "/dev/null", ""}), "none");
+    EXPECT_EQ(refused("/dev/null", {"/dev/null"}), "none");
+    EXPECT_EQ(refused("", {""}), "none");
+}
+
+TEST_F(OutputFile, KeepsTheOldContentWhenTheDiskIsFull)
+{
+    folder.write("file.csv", "old\n");
+    std::string reason;
+    {
+        const support::SmallFiles small(1000);
+        reason = refusal(file, std::string(1001, 'x'));
+        EXPECT_EQ(refusal(file, std::string(1000, 'y')), "none");
+    }
+    EXPECT_EQ(reason, file + ": cannot be written: File too large");
+    EXPECT_EQ(folder.read("file.csv"), std::string(1000, 'y'));
+    EXPECT_EQ(everythingIn(folder), Names{"file.csv"});
+}
+
+TEST_F(OutputFile, IsRefusedWithoutAName)
+{
+    EXPECT_EQ(refusal("", ""), ": cannot be written: No such file or directory");
+}
+
+TEST_F(OutputFile, IsRefusedWhereThereIsNoFolder)
+{
+    const std::string lost = folder.path("none/file.csv");
+    EXPECT_EQ(refusal(lost, ""), lost + ": cannot be written: No such file or directory");
+}
+
+TEST_F(OutputFile, IsCheckedWithoutLeavingAnything)
+{
+    checkWritable(file);
+    EXPECT_EQ(everythingIn(folder), Names{});
+    folder.write("file.csv", "old\n");
+    checkWritable(file);
+    EXPECT_EQ(folder.read("file.csv"), "old\n");
+    EXPECT_EQ(everythingIn(folder), Names{"file.csv"});
+}
+
+TEST_F(OutputFile, IsCheckedForAFolderAndAPlaceThatIsNoFile)
+{
+    EXPECT_THROW(checkWritable(folder.path("none/file.csv")), Error);
+    EXPECT_THROW(checkWritable(folder.path()), Error);
+    EXPECT_THROW(checkWritable("/dev/null"), Error);
+    EXPECT_THROW(checkWritable("/dev/full"), Error);
+    ASSERT_EQ(mkfifo(file.c_str(), 0600), 0);
+    EXPECT_THROW(checkWritable(file), Error);
+}
+
+}  // namespace
