@@ -228,14 +228,13 @@ private:
     void judge(const Attempt& asIs, Diagnosis& diagnosis)
     {
         const bool isMistaken = diagnosis.best.mistakes.count() > 0;
-        if (diagnosis.appearance.all().certainty() < meaningful) {
+        const bool isDecoded = asIs.decoded == diagnosis.blocks || diagnosis.best.decoded == diagnosis.blocks;
+        if (diagnosis.appearance.all().certainty() < (isDecoded ? meaningful : related)) {
             diagnosis.verdict = Verdict::unrelated;
         } else if (asIs.decoded == diagnosis.blocks) {
             diagnosis.verdict = isMistaken ? Verdict::careless : Verdict::healthy;
-        } else if (diagnosis.best.decoded == diagnosis.blocks) {
+        } else if (isDecoded) {
             diagnosis.verdict = Verdict::mistaken;
-        } else if (diagnosis.appearance.all().certainty() < related) {
-            diagnosis.verdict = Verdict::unrelated;
         } else if (diagnosis.stranger) {
             diagnosis.verdict = Verdict::strange;
         } else {
