@@ -6,6 +6,7 @@
 
 #include "Dump.h"
 #include "DumpFile.h"
+#include "base/Csv.h"
 #include "simulation/Shown.h"
 
 namespace morvik::comparison {
@@ -14,31 +15,12 @@ namespace {
 
 using simulation::shown;
 
-std::string_view field(std::string_view row, std::size_t number)
-{
-    for (; number > 0; --number) {
-        const std::size_t comma = row.find(',');
-        row.remove_prefix(comma == std::string_view::npos ? row.size() : comma + 1);
-    }
-    row = row.substr(0, row.find(','));
-    row.remove_prefix(std::min(row.find_first_not_of(' '), row.size()));
-    return row.substr(0, row.find_last_not_of(' ') + 1);
-}
+using Fields = std::vector<std::string_view>;
 
-std::size_t fieldsOf(std::string_view row)
+std::optional<std::size_t> findColumn(const Fields& header, std::string_view name)
 {
-    return static_cast<std::size_t>(std::count(row.begin(), row.end(), ',')) + 1;
-}
-
-std::optional<std::size_t> findColumn(std::string_view header, std::string_view name)
-{
-    const std::size_t count = fieldsOf(header);
-    for (std::size_t i = 0; i < count; ++i) {
-        if (field(header, i) == name) {
-            return i;
-        }
-    }
-    return std::nullopt;
+    const auto found = std::find(header.begin(), header.end(), name);
+    return found == header.end() ? std::nullopt : std::optional(static_cast<std::size_t>(found - header.begin()));
 }
 
 /// Whether a simulator writes a value of unknown bits so: as x, or with digits of x, z, u or w, "xxx", "0x7x", "zz01",
@@ -64,11 +46,11 @@ public:
         if (!itsFile.next()) {
             itsFile.fail("no header, expected the columns half_iteration, step, signal, value");
         }
-        readHeader(withoutMark(itsFile.line()));
-        while (itsFile.next()) {
-            if (!itsFile.line().empty()) {
-                readRow();
-            }
+        itsRow = base::fieldsOf(itsFile.line());
+        readHeader();
+        while (itsFile.nextFilled()) {
+            itsRow = base::fieldsOf(itsFile.line());
+            readRow();
         }
     }
 
@@ -79,88 +61,87 @@ private:
         std::size_t column;
     };
 
-    /// UTF-8 may open with a byte order mark, as spreadsheets write it.
-    static std::string_view withoutMark(std::string_view line)
+    void readHeader()
     {
-        constexpr std::string_view mark = "\xEF\xBB\xBF";
-        line.remove_prefix(line.substr(0, mark.size()) == mark ? mark.size() : 0);
-        return line;
-    }
-
-    void readHeader(std::string_view header)
-    {
-        itsPass = needColumn(header, itsMap.passColumn);
-        itsStep = needColumn(header, itsMap.stepColumn);
-        itsFields = fieldsOf(header);
-        itsSignal = findColumn(header, itsMap.signalColumn);
+        itsPass = needColumn(itsMap.passColumn);
+        itsStep = needColumn(itsMap.stepColumn);
+        itsFields = itsRow.size();
+        itsSignal = findColumn(itsRow, itsMap.signalColumn);
         if (itsSignal) {
-            itsValue = needColumn(header, itsMap.valueColumn);
+            itsValue = needColumn(itsMap.valueColumn);
             return;
         }
         for (std::size_t i = 0; i < itsFields; ++i) {
-            const std::string name(field(header, i));
-            const auto signal = itsMap.signal(name);
+            const auto signal = itsMap.signal(itsRow[i]);
             if (signal && *signal != NameMap::leftOut) {
-                itsColumns.push_back({name, *signal, i});
-                itsDump.given[*signal] = true;
+                addColumn(std::string(itsRow[i]), *signal, i);
             }
         }
         if (itsColumns.empty()) {
-            needColumn(header, itsMap.signalColumn);
+            needColumn(itsMap.signalColumn);
         }
     }
 
-    std::size_t needColumn(std::string_view header, const std::string& name) const
+    void addColumn(const std::string& name, unsigned signal, std::size_t column)
     {
-        const auto found = findColumn(header, name);
+        for (const SignalColumn& each : itsColumns) {
+            if (each.signal == signal) {
+                itsFile.fail("two columns are " + std::string(passSignals[signal]) + ", " + shown(each.name) + " and " +
+                             shown(name));
+            }
+        }
+        itsColumns.push_back({name, signal, column});
+        itsDump.given[signal] = true;
+    }
+
+    std::size_t needColumn(const std::string& name) const
+    {
+        const auto found = findColumn(itsRow, name);
         if (!found) {
-            itsFile.fail("no column " + shown(name) + " in the header " + shown(header));
+            itsFile.fail("no column " + shown(name) + " in the header " + shown(itsFile.line()));
         }
         return *found;
     }
 
     void readRow()
     {
-        const std::string_view row = itsFile.line();
-        if (fieldsOf(row) != itsFields) {
-            itsFile.fail(std::to_string(fieldsOf(row)) + " fields, expected the " + std::to_string(itsFields) +
+        if (itsRow.size() != itsFields) {
+            itsFile.fail(std::to_string(itsRow.size()) + " fields, expected the " + std::to_string(itsFields) +
                          " of the header");
         }
         if (!itsSignal) {
             for (const SignalColumn& each : itsColumns) {
-                take(each.name, each.signal, field(row, each.column));
+                take(each.name, each.signal, itsRow[each.column]);
             }
             return;
         }
-        const std::string_view name = field(row, *itsSignal);
+        const std::string_view name = itsRow[*itsSignal];
         const auto signal = itsMap.signal(name);
         if (!signal) {
             itsFile.fail("signal " + shown(name) + " is not known; a map tells which it is, or that it does not count");
         }
         if (*signal != NameMap::leftOut) {
-            take(name, *signal, field(row, itsValue));
+            take(name, *signal, itsRow[itsValue]);
         }
     }
 
     /// A row of unknown values may be one of before the simulation counts.
-    bool namesItsPlace(std::string_view row) const
+    bool namesItsPlace() const
     {
-        return !isUnknown(field(row, itsPass), NumberForm::integer) &&
-               !isUnknown(field(row, itsStep), NumberForm::integer);
+        return !isUnknown(itsRow[itsPass], NumberForm::integer) && !isUnknown(itsRow[itsStep], NumberForm::integer);
     }
 
     void take(std::string_view name, unsigned signal, std::string_view text)
     {
         itsDump.given[signal] = true;
-        const std::string_view row = itsFile.line();
         const bool unknown = isUnknown(text, itsMap.numbers);
-        if (text.empty() || (unknown && !namesItsPlace(row))) {
+        if (text.empty() || (unknown && !namesItsPlace())) {
             return;
         }
         const Place place = {
-            itsFile.count("half-iteration", field(row, itsPass), itsMap.firstPass, itsDump.values.passes()),
+            itsFile.count("half-iteration", itsRow[itsPass], itsMap.firstPass, itsDump.values.passes()),
             signal,
-            itsFile.count("step", field(row, itsStep), itsMap.firstStep, itsDump.values.steps())};
+            itsFile.count("step", itsRow[itsStep], itsMap.firstStep, itsDump.values.steps())};
         const std::int16_t value = unknown ? Values::unknown : itsFile.value(name, signal, text, itsMap);
         if (itsDump.values.at(place) != Values::missing) {
             itsFile.fail(std::string(name) + " of this half-iteration and step stands in line " +
@@ -173,6 +154,7 @@ private:
     DumpFile itsFile;
     const NameMap& itsMap;
     Dump& itsDump;
+    Fields itsRow;  // of the line
     std::size_t itsPass = 0;
     std::size_t itsStep = 0;
     std::size_t itsFields = 0;

@@ -11,6 +11,21 @@
 
 namespace morvik::comparison {
 
+bool DumpFile::nextFilled()
+{
+    constexpr unsigned most = 1000000;
+    const std::uint32_t first = number() + 1;
+    while (next()) {
+        if (line().find_first_not_of(" \t") != std::string::npos) {
+            return true;
+        }
+        if (number() - first >= most) {
+            fail("more than " + std::to_string(most) + " blank lines");
+        }
+    }
+    return false;
+}
+
 unsigned DumpFile::count(const std::string& what, std::string_view text, unsigned first, unsigned count) const
 {
     unsigned value = 0;

@@ -15,6 +15,9 @@ class DumpFile : public LineFile {
 public:
     using LineFile::LineFile;
 
+    /// Goes to the next line that has more than blanks; false at the end.
+    bool nextFilled();
+
     /// A number that counts from `first`, brought to 0 to `count` - 1.
     unsigned count(const std::string& what, std::string_view text, unsigned first, unsigned count) const;
 

@@ -71,6 +71,9 @@ public:
     }
 
 private:
+    /// More than a design has: a dump with more has no end.
+    static constexpr unsigned mostNets = 1U << 23;
+
     bool nextWord()
     {
         while (true) {
@@ -80,7 +83,7 @@ private:
                 itsRest.remove_prefix(itsWord.size());
                 return true;
             }
-            if (!itsFile.next()) {
+            if (!itsFile.nextFilled()) {
                 return false;
             }
             itsRest = itsFile.line();
@@ -95,9 +98,10 @@ private:
         return std::string(itsWord);
     }
 
-    /// The words up to $end, without blanks between them.
+    /// The words up to $end, without blanks between them; of those of a comment, some.
     std::string restOfCommand()
     {
+        constexpr std::size_t longest = 65536;
         std::string rest;
         for (;;) {
             if (!nextWord()) {
@@ -106,7 +110,7 @@ private:
             if (itsWord == "$end") {
                 return rest;
             }
-            rest += itsWord;
+            rest += rest.size() < longest ? itsWord : std::string_view();
         }
     }
 
@@ -127,7 +131,8 @@ private:
         }
         if (command == "$scope") {
             expectWord("the kind of a scope");
-            itsScopes.enter(expectWord("the name of a scope"));
+            const std::string name = expectWord("the name of a scope");
+            placed([&] { itsScopes.enter(name); });
         } else if (command == "$upscope") {
             placed([this] { itsScopes.leave(); });
         } else if (command == "$var") {
@@ -188,6 +193,9 @@ private:
         }
         variable.net = static_cast<unsigned>(itsNets.size());
         variable.net = itsNets.try_emplace(identifier, variable.net).first->second;
+        if (variable.net == mostNets) {
+            itsFile.fail("more than " + std::to_string(mostNets) + " identifiers");
+        }
         if (placed([&] { return itsScopes.declare(variable); })) {
             itsScopes.variables().back().bits = itsFile.count("width", width, 1, 65536) + 1;
         }

@@ -25,6 +25,9 @@ void VcdScopes::enter(const std::string& name)
     const auto number = static_cast<unsigned>(itsScopes.size());
     const auto [place, isNew] = itsScopeNumbers.try_emplace({itsScope, name}, number);
     if (isNew) {
+        if (number == mostScopes) {
+            throw simulation::Error("more than " + std::to_string(mostScopes) + " scopes");
+        }
         VcdScope scope;
         scope.name = name;
         scope.parent = itsScope;

@@ -45,6 +45,9 @@ struct VcdScope {
 /// thrown as a simulation::Error without a place.
 class VcdScopes {
 public:
+    /// More than a design has: a dump with more has no end.
+    static constexpr unsigned mostScopes = 1U << 20;
+
     explicit VcdScopes(const NameMap& map);
 
     /// A dump may come back to a scope that it has left.

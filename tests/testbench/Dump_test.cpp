@@ -4,7 +4,9 @@
 #include <gtest/gtest.h>
 
 #include <sstream>
+#include <streambuf>
 #include <string>
+#include <utility>
 
 #include "simulation/Error.h"
 
@@ -68,6 +70,58 @@ TEST(CsvDump, ReadsWhatASpreadsheetWrites)
 {
     const Dump dump = read(readCsv, "\xEF\xBB\xBFhalf_iteration,step,signal,value\r\n0,0,llr,5\r\n");
     EXPECT_EQ(dump.values.at({0, llr, 0}), 5);
+}
+
+TEST(CsvDump, ReadsBlanksAroundFieldsAndInEmptyLines)
+{
+    const Dump dump =
+        read(readCsv, "half_iteration, step,\tsignal , value\r\n0, 1,\tllr ,\t 5 \r\n \t\r\n 0,2,llr,x \r\n");
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 5);
+    EXPECT_TRUE(dump.values.isUnknown({0, llr, 2}));
+}
+
+/// Gives the text over and over.
+class Endless : public std::streambuf {
+public:
+    explicit Endless(std::string text) : itsText(std::move(text)) {}
+
+protected:
+    int_type underflow() override
+    {
+        setg(itsText.data(), itsText.data(), itsText.data() + itsText.size());
+        return traits_type::to_int_type(itsText.front());
+    }
+
+private:
+    std::string itsText;
+};
+
+TEST(Dump, RefusesWhatHasNoEndOrIsNoText)
+{
+    for (const Reader reader : {readCsv, readVcd}) {
+        using namespace std::string_literals;
+        const auto expectEnd = [reader](const std::string& text, const std::string& message) {
+            Endless content(text);
+            std::istream input(&content);
+            Dump dump(2, 43);
+            try {
+                reader(input, "dump", {}, dump);
+                FAIL() << "accepted";
+            } catch (const simulation::Error& error) {
+                EXPECT_EQ(error.what(), message);
+            }
+        };
+        expectEnd("\0"s, "dump:1: line is too long, allowed are 1048576 characters");
+        expectEnd("$comment ", "dump:1: line is too long, allowed are 1048576 characters");
+        expectRefused(reader, "\x1F\x8B\x08\n", "dump: is compressed by gzip; 'gunzip FILE' unpacks it");
+        expectRefused(reader,
+                      "\0\0\0\0\0\0\0\x01\x49\0"s,
+                      "dump: is an FST waveform; 'fst2vcd FILE > FILE.vcd' of GTKWave makes a VCD of it");
+    }
+    Endless blank("\n");
+    std::istream input(&blank);
+    Dump dump(2, 43);
+    EXPECT_THROW(readVcd(input, "dump", {}, dump), simulation::Error);
 }
 
 TEST(CsvDump, ReadsAColumnForEachSignal)
@@ -137,6 +191,7 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
         "255.875; a map tells other forms";
     expectRefused(readCsv, "", "dump:1: no header, expected the columns half_iteration, step, signal, value");
     expectRefused(readCsv, "a,b\n", R"(dump:1: no column "half_iteration" in the header "a,b")");
+    expectRefused(readCsv, "half_iteration,step,llr,g0,llr\n", R"(dump:1: two columns are llr, "llr" and "llr")");
     expectRefused(readCsv, header + "0,0,llr\n", "dump:2: 3 fields, expected the 4 of the header");
     expectRefused(readCsv,
                   header + "0,0,LLR,1\n",
