@@ -40,7 +40,10 @@ if(TARGET morvik-mpi)
     list(APPEND commands morvik-mpi)
 endif()
 file(RELATIVE_PATH to_libraries ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LIBDIR})
-set_target_properties(${commands} PROPERTIES INSTALL_RPATH "$ORIGIN/${to_libraries}")
+# The build's library is in ../lib, so that nothing is rewritten when the command is installed.
+set(runtime_path "$ORIGIN/${to_libraries}" "$ORIGIN/../lib")
+list(REMOVE_DUPLICATES runtime_path)
+set_target_properties(${commands} PROPERTIES INSTALL_RPATH "${runtime_path}" BUILD_WITH_INSTALL_RPATH ON)
 install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT command)
 
 # Manual pages, completions, and the pages that they refer to.
