@@ -327,12 +327,45 @@ void addSimulation(py::module_& module)
                py::arg("progress"));
 }
 
+/// Whether the interpreter is the process's first one; else an ImportError is set. In another one, pybind11 would wait
+/// for the lock that its own thread holds.
+bool isMainInterpreter()
+{
+    if (PyInterpreterState_Get() == PyInterpreterState_Main()) {
+        return true;
+    }
+    PyErr_SetString(PyExc_ImportError, "morvik works in the main interpreter alone, not in a subinterpreter");
+    return false;
+}
+
+/// For a module that another interpreter has loaded before. A plain function: one of pybind11 would wait as well.
+PyObject* expectMainInterpreter(PyObject*, PyObject*)
+{
+    if (!isMainInterpreter()) {
+        return nullptr;
+    }
+    Py_RETURN_NONE;
+}
+
+PyMethodDef plainFunctions[] = {{"expect_main_interpreter", expectMainInterpreter, METH_NOARGS, nullptr}, {}};
+
 }  // namespace
 
+// What pybind11 defines stands behind a check, since it waits before it begins with the module.
+#define PyInit__core initialiseCore
 PYBIND11_MODULE(_core, module)
 {
     module.attr("__version__") = MORVIK_VERSION;
+    if (PyModule_AddFunctions(module.ptr(), plainFunctions) != 0) {
+        throw py::error_already_set();
+    }
     addDecoder(module);
     addLink(module);
     addSimulation(module);
+}
+#undef PyInit__core
+
+extern "C" PYBIND11_EXPORT PyObject* PyInit__core()
+{
+    return isMainInterpreter() ? initialiseCore() : nullptr;
 }

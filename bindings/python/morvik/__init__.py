@@ -12,6 +12,10 @@
 docs/python.md tells the rest.
 """
 
+from morvik import _core
+
+_core.expect_main_interpreter()  # a module that is loaded already is not asked again by the import
+
 from morvik._core import __version__
 from morvik._decoder import Decoded, Decoder
 from morvik._errors import DecoderWarning, Error

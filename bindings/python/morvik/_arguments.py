@@ -8,6 +8,9 @@ import os
 from collections.abc import Callable, Iterable
 from typing import Any, TypeVar
 
+import numpy as np
+import numpy.typing as npt
+
 from morvik import _core
 from morvik._errors import Error
 
@@ -27,8 +30,10 @@ def integer(name: str, value: Any, low: int, high: int) -> int:
 
 
 def any_integer(name: str, value: Any) -> int:
-    """The value as an int."""
+    """The value as an int; a truth value is none."""
     try:
+        if isinstance(value, bool):
+            raise TypeError
         return operator.index(value)
     except TypeError:
         raise TypeError(f"{name} must be an integer, not {value!r}") from None
@@ -88,8 +93,12 @@ def thousandths(name: str, value: Any, low: float, high: float) -> int:
 
 
 def real(name: str, value: Any) -> float:
-    """The value as a finite float."""
+    """The value as a finite float. A text, a truth value and a complex number are none, though Python converts them."""
+    expect_unmasked(name, value)
+    kind = getattr(getattr(value, "dtype", None), "kind", "f")
     try:
+        if isinstance(value, (str, bytes, bytearray, bool)) or kind not in "iufO":
+            raise TypeError
         number = float(value)
     except (TypeError, ValueError):
         raise TypeError(f"{name} must be a number, not {value!r}") from None
@@ -108,8 +117,22 @@ def ebn0_thousandths(value: Any) -> int:
     return thousandths("ebn0_db", value, -50, 50)
 
 
+def expect_unmasked(name: str, values: Any) -> None:
+    """Refuses masked arrays, alone or in a list: what is masked would count like the rest."""
+    listed = values if isinstance(values, (list, tuple)) else ()
+    if any(isinstance(value, np.ma.MaskedArray) for value in (values, *listed)):
+        raise TypeError(f"{name} must not be a masked array, whose mask would be lost; take its .compressed() or .filled()")
+
+
+def plain_array(name: str, values: npt.ArrayLike) -> npt.NDArray[Any]:
+    """The values as an array."""
+    expect_unmasked(name, values)
+    return np.asarray(values)
+
+
 def each(name: str, values: Any, check: Callable[[Any], Value]) -> list[Value]:
     """Checks a single value, or each one of several, and lists them without those that come again."""
+    expect_unmasked(name, values)
     if isinstance(values, Iterable) and not isinstance(values, (str, bytes)) and getattr(values, "ndim", 1) > 0:
         several = list(dict.fromkeys(check(value) for value in values))
         if not several:

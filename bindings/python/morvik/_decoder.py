@@ -15,6 +15,7 @@ from morvik._arguments import (
     any_integer,
     expect_block,
     integer,
+    plain_array,
     thread_count,
     word,
 )
@@ -195,7 +196,7 @@ def _streams(*values: npt.ArrayLike) -> list[npt.NDArray[Any]]:
 
 def _soft_values(name: str, values: npt.ArrayLike) -> npt.NDArray[Any]:
     """The values as an array of int8, int16 or int32."""
-    array = np.asarray(values)
+    array = plain_array(name, values)
     if array.dtype.kind != "i":
         hint = {
             "f": "; multiply by the scale, round, then astype(numpy.int8)",
@@ -216,9 +217,9 @@ def _soft_values(name: str, values: npt.ArrayLike) -> npt.NDArray[Any]:
 
 def _tags(tag: npt.ArrayLike, blocks: int, is_single: bool) -> npt.NDArray[np.uint32]:
     """A tag for each block."""
-    if np.ndim(tag) == 0:
+    tags = plain_array("tag", tag)
+    if tags.ndim == 0:
         return np.full(blocks, integer("tag", tag, 0, _TAG_LIMIT), np.uint32)
-    tags = np.asarray(tag)
     if is_single or tags.shape != (blocks,):
         expected = "an integer" if is_single else f"an integer or have the shape ({blocks},), one for each block"
         raise ValueError(f"tag must be {expected}; its shape is {tags.shape}")

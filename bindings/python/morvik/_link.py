@@ -14,7 +14,9 @@ from morvik._arguments import (
     block_size,
     ebn0_thousandths,
     expect_block,
+    expect_unmasked,
     integer,
+    plain_array,
     scale_thousandths,
 )
 
@@ -114,6 +116,7 @@ def _received(
 
 
 def _three(streams: Any) -> tuple[Any, ...]:
+    expect_unmasked("streams", streams)
     three = tuple(streams)
     if len(three) != 3 or len({np.shape(stream) for stream in three}) != 1:
         raise ValueError("streams must be three arrays of one shape: sys, par1, par2")
@@ -122,7 +125,7 @@ def _three(streams: Any) -> tuple[Any, ...]:
 
 def _bits(name: str, values: npt.ArrayLike) -> npt.NDArray[np.uint8]:
     """The values as an array of 0 and 1."""
-    array = np.asarray(values)
+    array = plain_array(name, values)
     if array.dtype.kind not in "iub":
         raise TypeError(f"{name} must hold bits, as integers or booleans, not {array.dtype}")
     if array.ndim not in (1, 2):

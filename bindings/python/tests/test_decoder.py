@@ -320,3 +320,23 @@ def test_tells_its_generics():
 def test_generics_do_not_change(decoder):
     with pytest.raises(AttributeError):
         decoder.num_pu = 4
+
+
+def test_masked_arrays_are_refused(decoder, soft):
+    masked = np.ma.array(soft.par1, mask=soft.par1 > 0)
+    with pytest.raises(TypeError, match="par1 must not be a masked array"):
+        decoder.decode(soft.sys, masked, soft.par2)
+    with pytest.raises(TypeError, match="tag must not be a masked array"):
+        decoder.decode(*soft, tag=np.ma.array(3))
+
+
+@pytest.mark.parametrize("name", ["iterations", "tag"])
+def test_truth_values_are_no_numbers(decoder, soft, name):
+    with pytest.raises(TypeError, match=f"{name} must be an integer, not True"):
+        decoder.decode(*soft, **{name: True})
+
+
+@pytest.mark.parametrize("dtype", [float, complex, bool])
+def test_soft_values_are_integers(decoder, soft, dtype):
+    with pytest.raises(TypeError, match="sys must hold signed integers"):
+        decoder.decode(soft.sys.astype(dtype), soft.par1, soft.par2)

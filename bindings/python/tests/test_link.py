@@ -156,3 +156,39 @@ def test_seed_repeats_the_noise():
 def test_channel_refuses(arguments, kind, text):
     with pytest.raises(kind, match=text):
         morvik.awgn(**{"streams": morvik.encode(np.zeros(40, int)), "ebn0_db": 1.0, **arguments})
+
+
+BITS = np.zeros(40, np.uint8)
+CODED = tuple(np.zeros(44, np.uint8) for _ in range(3))
+
+
+@pytest.mark.parametrize("value", ["1", b"1", True, np.True_, 1j, np.complex128(1), np.array("1"), np.ma.array(1.0), None])
+@pytest.mark.parametrize("name", ["ebn0_db", "scale"])
+def test_what_is_no_number_is_refused(name, value):
+    if (name, value) == ("scale", None):
+        return  # means the default
+    with pytest.raises(TypeError, match=f"{name} must"):
+        morvik.awgn(CODED, **{"ebn0_db": 1, name: value})
+
+
+@pytest.mark.parametrize("value", [np.nan, np.inf])
+def test_a_number_must_be_finite(value):
+    with pytest.raises(ValueError, match="ebn0_db must be a finite number"):
+        morvik.awgn(CODED, value)
+
+
+def test_masked_arrays_are_refused():
+    with pytest.raises(TypeError, match="bits must not be a masked array"):
+        morvik.encode(np.ma.array(BITS, mask=BITS == 1))
+    with pytest.raises(TypeError, match="bits must not be a masked array"):
+        morvik.encode([np.ma.array(BITS), np.ma.array(BITS)])
+    with pytest.raises(TypeError, match="streams must not be a masked array"):
+        morvik.awgn(tuple(np.ma.array(stream) for stream in CODED), 1)
+    with pytest.raises(TypeError, match="ebn0_db must not be a masked array"):
+        morvik.error_rate(40, np.ma.array([1.0, 2.0], mask=[True, False]), max_blocks=1)
+
+
+@pytest.mark.parametrize("bits", [[0.0] * 40, [0j] * 40, [np.nan] * 40, ["0"] * 40])
+def test_bits_are_integers_or_booleans(bits):
+    with pytest.raises(TypeError, match="bits must hold bits"):
+        morvik.encode(bits)

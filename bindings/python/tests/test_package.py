@@ -8,6 +8,7 @@ import sys
 from pathlib import Path
 
 import morvik
+import pytest
 
 PACKAGE = Path(morvik.__file__).parent
 
@@ -76,3 +77,21 @@ def test_module_shows_nobody_its_copy_of_the_library():
     (module,) = PACKAGE.glob("_core.*.so")
     symbols = subprocess.run(["nm", "-D", "--defined-only", module], capture_output=True, text=True, check=True).stdout
     assert [line.split()[-1] for line in symbols.splitlines()] == ["PyInit__core"]
+
+
+@pytest.mark.parametrize("before", ["", "import morvik\n"])
+def test_a_subinterpreter_is_refused(tmp_path, before):
+    script = tmp_path / "subinterpreter.py"
+    script.write_text(
+        f"{before}"
+        "import _xxsubinterpreters as interpreters\n"
+        "inner = interpreters.create()\n"
+        "try:\n"
+        "    interpreters.run_string(inner, 'import morvik')\n"
+        "except interpreters.RunFailedError as error:\n"
+        "    print(error)\n"
+    )
+    result = subprocess.run([sys.executable, str(script)], capture_output=True, text=True, timeout=60)
+    assert result.returncode == 0, result.stderr
+    assert "ImportError" in result.stdout
+    assert "morvik works in the main interpreter alone, not in a subinterpreter" in result.stdout
