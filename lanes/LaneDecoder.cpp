@@ -234,7 +234,7 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
     bool within = loadRows(*itsKernel, lanes, steps(), rows);
     for (unsigned block = 0; block < itsBlocks; ++block) {
         for (unsigned position = 0; position < tailPositions; ++position) {
-            const int value = valueAt(blocks[block].*stream, std::size_t{itsCut.blockSize} + position);
+            const auto value = int{valueAt(blocks[block].*stream, std::size_t{itsCut.blockSize} + position)};
             itsTails[block][3 * position + s] = value;
             within = within && value >= branchMin && value <= branchMax;
         }

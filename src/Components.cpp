@@ -32,9 +32,9 @@ void releaseOne(Component*& component)
 template <class Value>
 std::uint64_t bitsOf(Value value)
 {
-    static_assert(std::is_scalar_v<Value> && sizeof value <= sizeof(std::uint64_t));
+    static_assert(std::is_scalar_v<Value> && sizeof(Value) <= sizeof(std::uint64_t));
     std::uint64_t bits = 0;
-    std::memcpy(&bits, &value, sizeof value);
+    std::memcpy(&bits, &value, sizeof(Value));
     return bits;
 }
 

@@ -55,7 +55,7 @@ void convert(State& state, const lanes::Streams<Input>& block, std::int32_t dinS
     for (std::int32_t i = 0; i < dinSize; ++i) {
         for (unsigned s = 0; s < streamCount; ++s) {
             std::int32_t excess = 0;
-            const std::int32_t value = lanes::valueAt(streams[s], static_cast<std::size_t>(i));
+            const auto value = std::int32_t{lanes::valueAt(streams[s], static_cast<std::size_t>(i))};
             const std::int32_t kept = inputInteger(value, *state.input_format, excess);
             if (excess != 0) {
                 reportSaturation(state, s, i, excess > 0);
