@@ -32,10 +32,14 @@ void releaseOne(Component*& component)
 template <class Value>
 std::uint64_t bitsOf(Value value)
 {
-    static_assert(std::is_scalar_v<Value> && sizeof(Value) <= sizeof(std::uint64_t));
-    std::uint64_t bits = 0;
-    std::memcpy(&bits, &value, sizeof(Value));
-    return bits;
+    if constexpr (std::is_pointer_v<Value>) {
+        return reinterpret_cast<std::uintptr_t>(value);
+    } else {
+        static_assert(std::is_scalar_v<Value> && sizeof(Value) <= sizeof(std::uint64_t));
+        std::uint64_t bits = 0;
+        std::memcpy(&bits, &value, sizeof(Value));
+        return bits;
+    }
 }
 
 template <class Use, class... Values>
