@@ -57,14 +57,16 @@ constexpr std::int16_t wordOf(Held value)
     return value.value;
 }
 
-/// The table of TCalculationEngineModBase::createLUT, called with a decision difference.
+/// The table of TCalculationEngineModBase::createLUT, called with a decision difference. Words of narrower registers
+/// are shifted up by the bits that those lack.
 template <class Value>
 struct Corrections {
     const unsigned char* middle;
+    unsigned shift = 0;
 
     Value operator()(Value difference) const
     {
-        return fromWord<Value>(middle[wordOf(difference)]);
+        return fromWord<Value>(static_cast<std::int16_t>(middle[wordOf(difference) >> shift] << shift));
     }
 };
 

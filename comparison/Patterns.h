@@ -3,7 +3,6 @@
 #define MORVIK_COMPARISON_PATTERNS_H
 
 #include <cstddef>
-#include <optional>
 #include <string>
 #include <vector>
 
@@ -17,16 +16,20 @@ namespace morvik::comparison {
 struct Finding {
     Stage stage;
     std::size_t faults = 0;
-    std::string where;     ///< "at the starts of windows alone"
-    std::string how;       ///< the mistake by which the values are as they are; empty when none explains them
-    double explained = 0;  ///< the part of the faults that the mistake gives
+    bool isByChance = false;  ///< so few, or so much alike, that what is found may be chance
+    std::string where;        ///< "at the starts of windows alone"
+    /// The mistakes that give these values, all as many of them, and with which the right values are as they are.
+    std::vector<std::string> how;
+    std::string shared;    ///< "one LSB too high": what the wrong values have in common, where no mistake is found
+    double explained = 0;  ///< the part of the faults for which that holds
 };
 
 /// A finding for each stage that has faults, in the order in which they appear first.
 std::vector<Finding> findPatterns(const Model& model, const Values& dump, const Comparison& comparison);
 
-/// The dump counts passes or steps in another way: what to change, when most values fit then.
-std::optional<std::string> findShift(const Model& model, const Values& dump);
+/// The dump counts passes or steps in another way: what to change. With it, most wrong values are right, and most right
+/// ones stay so. Several are found where they do that equally well.
+std::vector<std::string> findShifts(const Model& model, const Values& dump);
 
 }  // namespace morvik::comparison
 

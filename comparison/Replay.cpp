@@ -14,25 +14,52 @@ namespace {
 
 constexpr int step = 16;  // of the state metrics' format, in aligned words
 constexpr int stepMask = -step;
+constexpr int spareBits = 4;  // below a step
+constexpr int metricBits = 12;
+constexpr int softBits = 8;
 constexpr int branchLowest = -2048;  // the branch format's limits in aligned words
 constexpr int branchHighest = 2032;
 
-std::vector<unsigned char> corrections()
+std::vector<unsigned char> correctionTable()
 {
     const std::unique_ptr<TNumberFormat> format(TNumberFormat::create("Fix_12_3"));
     return TCalculationEngineModBase::createLUT(16, *format);
 }
 
+/// The low bits of a value, sign-extended.
+int cutTo(int value, int bits)
+{
+    const auto above = static_cast<std::uint32_t>(32 - spareBits - bits);
+    return arithmetic::shiftRight(arithmetic::shiftLeftWrap(value, above), above);
+}
+
+int clippedTo(int value, int bits)
+{
+    const int end = step << (bits - 1);
+    return arithmetic::clip(value, -end, end - step);
+}
+
 /// A branch metric or extrinsic value as eight bits of a step each hold it (rules 5 and 14).
 int narrowed(int value, Mistake mistake)
 {
-    if (mistake == Mistake::unclipped) {
+    switch (mistake.kind) {
+    case Mistake::unclipped:
         return arithmetic::wrap16(value);
+    case Mistake::clippedTo:
+        return clippedTo(value, mistake.number);
+    case Mistake::clippedSymmetric:
+        return arithmetic::clip(value, -branchHighest, branchHighest);
+    case Mistake::wrappedTo:
+        return cutTo(value, mistake.number);
+    default:
+        return arithmetic::clip(value, branchLowest, branchHighest);
     }
-    if (mistake == Mistake::wrappedInEight) {
-        return static_cast<std::int8_t>(value >> 4) * step;
-    }
-    return arithmetic::clip(value, branchLowest, branchHighest);
+}
+
+/// By how many bits words of narrower registers are shifted up, so that they wrap where those do.
+unsigned shiftOf(Mistake mistake)
+{
+    return mistake == Mistake::computedIn ? static_cast<unsigned>(metricBits - mistake.number) : 0;
 }
 
 /// Calls use(rule, value) with the rule of decisions and a value of its kind.
@@ -40,16 +67,17 @@ template <class Use>
 auto withRule(int algorithm, Mistake mistake, const unsigned char* middle, Use use)
 {
     using Word = std::int16_t;
+    const Corrections<Word> corrections{middle, shiftOf(mistake)};
     if (algorithm != 2 || mistake == Mistake::uncorrected) {
         return mistake == Mistake::unwrapped ? use(trellis::DecideMax<Held>(), Held())
                                              : use(trellis::DecideMax<Word>(), Word());
     }
     if (mistake == Mistake::correctedAtOnce) {
-        return use(trellis::DecideMaxStar<Word, Corrections<Word>>(Corrections<Word>{middle}), Word());
+        return use(trellis::DecideMaxStar<Word, Corrections<Word>>(corrections), Word());
     }
     return mistake == Mistake::unwrapped
                ? use(trellis::DecideMaxHash<Held, Corrections<Held>>(Corrections<Held>{middle}), Held())
-               : use(trellis::DecideMaxHash<Word, Corrections<Word>>(Corrections<Word>{middle}), Word());
+               : use(trellis::DecideMaxHash<Word, Corrections<Word>>(corrections), Word());
 }
 
 template <class Decision, class Value>
@@ -89,6 +117,27 @@ bool startsSegment(const Windows& windows, unsigned trellisStep)
 }
 
 template <class Words>
+Words shifted(Words words, unsigned bits)
+{
+    for (auto& word : words) {
+        word = arithmetic::wrap16(arithmetic::shiftLeftWrap(word, bits));
+    }
+    return words;
+}
+
+/// Metrics as the registers hold them.
+template <class Metrics>
+Metrics registered(Metrics metrics, Mistake mistake)
+{
+    if (mistake.kind == Mistake::storedIn || mistake.kind == Mistake::computedIn) {
+        for (auto& metric : metrics) {
+            metric = arithmetic::wrap16(cutTo(metric, mistake.number));
+        }
+    }
+    return metrics;
+}
+
+template <class Words>
 Column inSteps(const Words& words, bool complete)
 {
     Column column;
@@ -101,7 +150,8 @@ Column inSteps(const Words& words, bool complete)
 
 }  // namespace
 
-Replay::Replay(const Model& model, const Values& dump) : itsModel(model), itsDump(dump), itsCorrections(corrections())
+Replay::Replay(const Model& model, const Values& dump)
+    : itsModel(model), itsDump(dump), itsCorrections(correctionTable())
 {
 }
 
@@ -144,7 +194,7 @@ unsigned Replay::aprioriStep(unsigned code, unsigned trellisStep, Mistake mistak
 {
     const unsigned K = itsModel.windows.K;
     const auto& order = itsModel.codes[code].order;
-    switch (mistake) {
+    switch (mistake.kind) {
     case Mistake::aprioriUnpermuted:
         return trellisStep;
     case Mistake::aprioriInverse:
@@ -171,19 +221,51 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
     }
     const bool unpermuted = mistake == Mistake::systematicUnpermuted && !isTail;
     const int systematic = (unpermuted ? itsModel.codes[1 - d] : code).systematic[trellisStep];
-    return ((apriori / 2) & stepMask) + systematic;  // rule 13, before the last division
+    const int sum = ((apriori / 2) & stepMask) + systematic;  // rule 13, before the last division
+    return mistake == Mistake::intrinsicWrapped   ? cutTo(sum, softBits)
+           : mistake == Mistake::intrinsicClipped ? clippedTo(sum, softBits)
+                                                  : sum;
 }
 
-int Replay::twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const
+Replay::TwiceIntrinsic Replay::twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const
 {
     // A dump lacks the bit below a step. Hardware whose intrinsic value has other reasons than the inputs may have
     // another one there than follows from them: then what is computed with it tells.
     const int kept = input({pass, signalsOf(Stage::intrinsic).first, trellisStep}, complete);
-    bool ignored = true;
-    const int computed = twiceIntrinsicFromInputs(pass, trellisStep, Mistake::none, ignored);
-    const int likely = ((computed / 2) & stepMask) == kept ? computed : 2 * kept;
+    bool hasInputs = true;
+    const int computed = twiceIntrinsicFromInputs(pass, trellisStep, {}, hasInputs);
+    const bool isComputed = ((computed / 2) & stepMask) == kept;
+    const int likely = isComputed ? computed : 2 * kept;
     const int other = likely ^ step;
-    return !givesWhatFollows(pass, trellisStep, likely) && givesWhatFollows(pass, trellisStep, other) ? other : likely;
+    const bool isOther = !givesWhatFollows(pass, trellisStep, likely) && givesWhatFollows(pass, trellisStep, other);
+    return {isOther ? other : likely, isComputed && hasInputs};
+}
+
+bool Replay::isInDump(unsigned pass, Stage stage, unsigned trellisStep, const Column& column) const
+{
+    const auto [first, count] = signalsOf(stage);
+    for (unsigned i = 0; i < count; ++i) {
+        const Place place = {pass, first + i, trellisStep};
+        if (itsDump.has(place) && itsDump.at(place) != column.values[i]) {
+            return false;
+        }
+    }
+    return true;
+}
+
+template <class Compute>
+Column Replay::fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisStep, Compute compute) const
+{
+    bool complete = true;
+    const TwiceIntrinsic twice = twiceIntrinsic(pass, trellisStep, complete);
+    const auto likely = compute(twice.value, complete);
+    const Column column = inSteps(likely, complete);
+    if (twice.isSure || isInDump(pass, stage, trellisStep, column)) {
+        return column;
+    }
+    const auto unlikely = compute(twice.value ^ step, complete);
+    const Column other = inSteps(unlikely, complete);
+    return isInDump(pass, stage, trellisStep, other) ? other : column;
 }
 
 bool Replay::givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const
@@ -195,8 +277,8 @@ bool Replay::givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) co
     const auto branches = inputs<Branches>(pass, Stage::branch, trellisStep, complete);
     const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
     const int extrinsic = input({pass, signalsOf(Stage::extrinsic).first, trellisStep}, complete);
-    return complete && branchMetrics(pass, trellisStep, twice, Mistake::none) == branches &&
-           extrinsicValue(ratio, twice, Mistake::none) == extrinsic;
+    return complete && branchMetrics(pass, trellisStep, twice, {}) == branches &&
+           extrinsicValue(ratio, twice, {}) == extrinsic;
 }
 
 Column Replay::intrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
@@ -213,8 +295,16 @@ Replay::Branches Replay::branchMetrics(unsigned pass, unsigned trellisStep, int 
     if (mistake == Mistake::parityNegated) {
         parity = -parity;
     }
+    if (mistake == Mistake::doubledWrapped) {
+        twice = cutTo(twice, softBits);
+    } else if (mistake == Mistake::doubledClipped) {
+        twice = clippedTo(twice, softBits);
+    }
     Branches metrics{};
-    const auto sums = trellis::branchSums(twice, parity, 0);
+    auto sums = trellis::branchSums(twice, parity, 0);
+    if (mistake == Mistake::negationWrapped) {
+        sums[1] = sums[2] = twice + cutTo(-parity, softBits);
+    }
     for (std::size_t i = 0; i < sums.size(); ++i) {
         metrics[i] = arithmetic::wrap16(narrowed(sums[i], mistake));
     }
@@ -223,25 +313,26 @@ Replay::Branches Replay::branchMetrics(unsigned pass, unsigned trellisStep, int 
 
 Column Replay::branchColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
-    bool complete = true;
-    const int twice = twiceIntrinsic(pass, trellisStep, complete);
-    return inSteps(branchMetrics(pass, trellisStep, twice, mistake), complete);
+    return fromTwiceIntrinsic(pass, Stage::branch, trellisStep, [&](int twice, bool&) {
+        return branchMetrics(pass, trellisStep, twice, mistake);
+    });
 }
 
 Replay::Metrics Replay::reached(
     unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, bool& complete) const
 {
     const bool isForward = stage == Stage::forward;
-    const auto metrics = inputs<Metrics>(pass, stage, from, complete);
-    const auto branches = inputs<Branches>(pass, Stage::branch, from, complete);
+    const unsigned shift = shiftOf(mistake);
+    const auto metrics = shifted(inputs<Metrics>(pass, stage, from, complete), shift);
+    const auto branches = shifted(inputs<Branches>(pass, Stage::branch, from, complete), shift);
     const int algorithm = itsModel.generics.C_ALGORITHM_TYPE;
     Metrics earlierMetrics{};
     Branches earlierBranches{};
     hasEarlier = hasEarlier && algorithm == 2;
     if (hasEarlier) {
         const unsigned earlier = isForward ? from - 1 : from + 1;
-        earlierMetrics = inputs<Metrics>(pass, stage, earlier, complete);
-        earlierBranches = inputs<Branches>(pass, Stage::branch, earlier, complete);
+        earlierMetrics = shifted(inputs<Metrics>(pass, stage, earlier, complete), shift);
+        earlierBranches = shifted(inputs<Branches>(pass, Stage::branch, earlier, complete), shift);
     }
     const auto advance = [&](const auto& rule, auto kind) {
         using Value = decltype(kind);
@@ -258,7 +349,7 @@ Replay::Metrics Replay::reached(
         const auto next = nextColumn(rule, isForward, column, fromWords<Value>(branches));
         Metrics words{};
         for (std::size_t state = 0; state < words.size(); ++state) {
-            words[state] = wordOf(rule.stored(next[state]));
+            words[state] = static_cast<std::int16_t>(wordOf(rule.stored(next[state])) >> shift);
         }
         return words;
     };
@@ -270,15 +361,38 @@ namespace {
 template <class Metrics>
 Metrics border(Metrics column, Mistake mistake)
 {
+    const std::int16_t mask = mistake == Mistake::borderUnknown ? std::int16_t{0}
+                              : mistake == Mistake::borderMask  ? arithmetic::wrap16(mistake.number * step)
+                                                                : arithmetic::borderMask;
     for (auto& metric : column) {
-        metric = mistake == Mistake::borderUnknown    ? std::int16_t{0}
-                 : mistake == Mistake::borderBitsKept ? metric
-                                                      : arithmetic::maskBits(metric, arithmetic::borderMask);
+        metric = arithmetic::maskBits(metric, mask);
     }
     return column;
 }
 
 }  // namespace
+
+std::optional<unsigned> Replay::borderPass(unsigned pass, bool ofThisPass, Mistake mistake)
+{
+    const unsigned right = ofThisPass ? pass : pass - 2;
+    if (pass < 2) {
+        return std::nullopt;
+    }
+    switch (mistake.kind) {
+    case Mistake::borderOfThisPass:
+        return pass;
+    case Mistake::borderOfLastPass:
+        return pass - 2;
+    case Mistake::borderOfOtherCode:
+        return pass - 1;
+    case Mistake::borderLate:
+        return right < 2 ? std::nullopt : std::optional(right - 2);
+    case Mistake::borderOfFirstPass:
+        return pass % 2;
+    default:
+        return right;
+    }
+}
 
 Replay::Metrics Replay::forwardStart(unsigned pass, unsigned segment, Mistake mistake, bool& complete) const
 {
@@ -288,11 +402,12 @@ Replay::Metrics Replay::forwardStart(unsigned pass, unsigned segment, Mistake mi
         known[0] = 0;
         return known;
     }
-    if (pass < 2 || segment == 0) {
+    const auto from = borderPass(pass, false, mistake);
+    if (!from || segment == 0) {
         return {};
     }
     const unsigned length = itsModel.windows.segmentLength;
-    return border(reached(pass - 2, Stage::forward, segment * length - 1, length > 1, mistake, complete), mistake);
+    return border(reached(*from, Stage::forward, segment * length - 1, length > 1, mistake, complete), mistake);
 }
 
 Column Replay::forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
@@ -301,20 +416,26 @@ Column Replay::forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistak
     const Windows& windows = itsModel.windows;
     if (startsSegment(windows, trellisStep)) {
         const Metrics start = forwardStart(pass, trellisStep / windows.segmentLength, mistake, complete);
-        return inSteps(start, complete);
+        return inSteps(registered(start, mistake), complete);
     }
     const bool hasEarlier = !startsSegment(windows, trellisStep - 1);
     const Metrics next = reached(pass, Stage::forward, trellisStep - 1, hasEarlier, mistake, complete);
-    return inSteps(next, complete);
+    return inSteps(registered(next, mistake), complete);
 }
 
-Replay::Metrics Replay::tail(unsigned pass) const
+Replay::Metrics Replay::tail(unsigned pass, Mistake mistake) const
 {
     const Code& code = itsModel.codes[codeOf(pass)];
     trellis::Tail<int> steps{};
     for (unsigned i = 0; i < 3; ++i) {
         steps.x[i] = code.systematic[itsModel.windows.K + i];
         steps.p[i] = code.parity[itsModel.windows.K + i];
+        if (mistake == Mistake::tailClipped) {
+            const int sum = narrowed(steps.x[i] + steps.p[i], {});
+            const int difference = narrowed(steps.x[i] - steps.p[i], {});
+            steps.x[i] = (sum + difference) / 2;  // these have the clipped sum and difference
+            steps.p[i] = (sum - difference) / 2;
+        }
     }
     Metrics column{};
     const auto metrics = trellis::tailColumn(steps);
@@ -328,17 +449,17 @@ Replay::Metrics Replay::backwardStart(unsigned pass, const Window& window, Mista
 {
     const Windows& windows = itsModel.windows;
     if (windows.isFinal(window)) {
-        return border(tail(pass), mistake);
-    }
-    if (pass < 2) {
-        return {};
+        return border(tail(pass, mistake), mistake);
     }
     // Rule 20: the last row of three or more starts from what the first row has just left.
-    bool ofThisPass = windows.rows >= 3 && window.row + 1 == windows.rows;
-    ofThisPass = ofThisPass != (mistake == Mistake::borderOfOtherPass);
+    const bool ofThisPass = windows.rows >= 3 && window.row + 1 == windows.rows;
+    const auto left = borderPass(pass, ofThisPass, mistake);
+    if (!left) {
+        return {};
+    }
     const unsigned from = window.last + 1;
     const bool hasEarlier = from < windows.at(from).last;
-    return border(reached(ofThisPass ? pass : pass - 2, Stage::backward, from, hasEarlier, mistake, complete), mistake);
+    return border(reached(*left, Stage::backward, from, hasEarlier, mistake, complete), mistake);
 }
 
 Column Replay::backwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
@@ -347,43 +468,77 @@ Column Replay::backwardColumn(unsigned pass, unsigned trellisStep, Mistake mista
     const Window& window = itsModel.windows.at(trellisStep);
     if (trellisStep == window.last) {
         const Metrics start = backwardStart(pass, window, mistake, complete);
-        return inSteps(start, complete);
+        return inSteps(registered(start, mistake), complete);
     }
     const Metrics next =
         reached(pass, Stage::backward, trellisStep + 1, trellisStep + 1 < window.last, mistake, complete);
-    return inSteps(next, complete);
+    return inSteps(registered(next, mistake), complete);
 }
 
 Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const auto a = inputs<Metrics>(pass, Stage::forward, trellisStep, complete);
-    const auto b = inputs<Metrics>(pass, Stage::backward, trellisStep, complete);
-    const auto g = inputs<Branches>(pass, Stage::branch, trellisStep, complete);
+    const unsigned shift = shiftOf(mistake);
+    const auto a = shifted(inputs<Metrics>(pass, Stage::forward, trellisStep, complete), shift);
+    const auto b = shifted(inputs<Metrics>(pass, Stage::backward, trellisStep, complete), shift);
+    const auto g = shifted(inputs<Branches>(pass, Stage::branch, trellisStep, complete), shift);
     const auto ratio = [&](const auto& rule, auto kind) {
         using Value = decltype(kind);
-        return wordOf(trellis::logLikelihoodRatio(rule, fromWords<Value>(a), fromWords<Value>(b), fromWords<Value>(g)));
+        const auto forward = fromWords<Value>(a);
+        const auto backward = fromWords<Value>(b);
+        const auto branches = fromWords<Value>(g);
+        if (mistake == Mistake::ratioHeld) {
+            return held(wordOf(trellis::bestPath<1>(rule, forward, backward, branches)) -
+                        wordOf(trellis::bestPath<0>(rule, forward, backward, branches)))
+                .value;
+        }
+        return wordOf(trellis::logLikelihoodRatio(rule, forward, backward, branches));
     };
     const std::int16_t word =
         withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, itsCorrections.data() + itsCorrections.size() / 2, ratio);
-    return inSteps(std::array<std::int16_t, 1>{word}, complete);
+    const auto unshifted = static_cast<std::int16_t>(word >> shift);
+    return inSteps(registered(std::array<std::int16_t, 1>{unshifted}, mistake), complete);
+}
+
+int Replay::wideExtrinsicValue(int ratio, int twice, Mistake mistake) const
+{
+    const int value = ratio - 2 * twice;
+    return itsModel.generics.C_ALGORITHM_TYPE == 1 && mistake != Mistake::unscaled ? 3 * value / 4 : value;
 }
 
 int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const
 {
-    int value = ratio - 2 * twice;
-    if (itsModel.generics.C_ALGORITHM_TYPE == 1 && mistake != Mistake::unscaled) {
-        value = 3 * value / 4;  // rule 14
+    return narrowed(wideExtrinsicValue(ratio, twice, mistake), mistake) & stepMask;
+}
+
+unsigned Replay::roundingClass(unsigned pass, Stage stage, unsigned trellisStep) const
+{
+    bool complete = true;
+    if (stage == Stage::intrinsic && pass > 0 && trellisStep < itsModel.windows.K) {
+        const unsigned from = aprioriStep(codeOf(pass), trellisStep, {});
+        const int half = input({pass - 1, signalsOf(Stage::extrinsic).first, from}, complete) / 2;
+        const int sum = twiceIntrinsicFromInputs(pass, trellisStep, {}, complete);
+        const bool loses = ((half | sum / 2) & ~stepMask) != 0;
+        return !loses ? 0
+                      : 1U + ((half & ~stepMask) != 0 ? 1U : 0U) + ((sum / 2 & ~stepMask) != 0 ? 2U : 0U) +
+                            (half < 0 ? 4U : 0U) + (sum < 0 ? 8U : 0U);
     }
-    return narrowed(value, mistake) & stepMask;
+    if (stage == Stage::extrinsic) {
+        const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
+        const int value = wideExtrinsicValue(ratio, twiceIntrinsic(pass, trellisStep, complete).value, {});
+        const auto lost = static_cast<unsigned>(value & ~stepMask);
+        const bool isClipped = value < branchLowest || value > branchHighest;
+        return lost == 0 || isClipped ? 0 : lost + (value < 0 ? static_cast<unsigned>(step) : 0U);
+    }
+    return 0;
 }
 
 Column Replay::extrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
-    bool complete = true;
-    const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
-    const int twice = twiceIntrinsic(pass, trellisStep, complete);
-    return inSteps(std::array<int, 1>{extrinsicValue(ratio, twice, mistake)}, complete);
+    return fromTwiceIntrinsic(pass, Stage::extrinsic, trellisStep, [&](int twice, bool& complete) {
+        const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
+        return std::array<int, 1>{extrinsicValue(ratio, twice, mistake)};
+    });
 }
 
 }  // namespace morvik::comparison

@@ -2,6 +2,7 @@
 #include "Report.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstdarg>
 #include <cstdio>
 #include <vector>
@@ -12,8 +13,7 @@ namespace morvik::comparison {
 
 namespace {
 
-constexpr unsigned contextSteps = 3;     // before and behind the first difference
-constexpr std::size_t fewestFaults = 4;  // that show a pattern
+constexpr unsigned contextSteps = 3;  // before and behind the first difference
 
 __attribute__((format(printf, 1, 2))) std::string format(const char* form, ...)
 {
@@ -64,6 +64,16 @@ std::string shortName(Stage stage)
 {
     constexpr std::array<const char*, 6> names = {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"};
     return names[static_cast<std::size_t>(stage)];
+}
+
+/// What is found, or all that may be.
+std::string eitherOf(const std::vector<std::string>& texts)
+{
+    std::string all = texts.size() > 1 ? "either " : "";
+    for (const std::string& each : texts) {
+        all += (&each == &texts.front() ? "" : ", or ") + each;
+    }
+    return all;
 }
 
 class Reporter {
@@ -335,31 +345,36 @@ private:
     void addFindings()
     {
         addUnknown();
-        if (itsCompared.otherRun) {
-            itsText += "Found: the dump is what the model computes " + *itsCompared.otherRun + ".\n";
-        } else if (const auto shift = findShift(itsModel, itsDump.values)) {
-            itsText += "Found: " + *shift + ".\n";
+        if (!itsCompared.otherRuns.empty()) {
+            itsText += "Found: the dump is what the model computes " + eitherOf(itsCompared.otherRuns) + ".\n";
+        } else if (const auto shifts = findShifts(itsModel, itsDump.values); !shifts.empty()) {
+            itsText += "Found: " + eitherOf(shifts) + ".\n";
             return;
         }
         for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison)) {
-            if (itsCompared.otherRun && finding.how.empty()) {
-                continue;  // it is explained
+            if (itsCompared.otherRuns.empty() || !finding.how.empty()) {  // else it is explained
+                addFinding(finding);
             }
-            const std::string values = wordsOf(finding.stage).values;
-            itsText += "Found in " + values + ", " +
-                       counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
-            itsText += finding.where.empty() ? "" : ", " + finding.where;
-            itsText += ":\n  ";
-            if (finding.how.empty()) {
-                itsText += "no pattern that is known";
-            } else if (finding.explained >= 1) {
-                itsText += finding.how;
-            } else {
-                itsText += finding.how + format(", in %.0f %% of them", 100 * finding.explained);
-            }
-            const bool few = !finding.how.empty() && finding.faults < fewestFaults;
-            itsText += few ? "; with so few, this may be chance.\n" : ".\n";
         }
+    }
+
+    void addFinding(const Finding& finding)
+    {
+        itsText += std::string("Found in ") + wordsOf(finding.stage).values + ", " +
+                   counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
+        itsText += (finding.where.empty() ? "" : ", " + finding.where) + ":\n  ";
+        const std::string part = format("%.0f %% of them", std::floor(100 * finding.explained));
+        if (!finding.how.empty()) {
+            itsText += eitherOf(finding.how) + (finding.explained < 1 ? ", in " + part : "");
+            itsText += finding.isByChance ? "; with so few, this may be chance.\n" : ".\n";
+            return;
+        }
+        itsText += "no pattern that is known";
+        if (!finding.shared.empty()) {
+            itsText += finding.faults == 1 ? "; it is " : finding.explained < 1 ? "; " + part + " are " : "; all are ";
+            itsText += finding.shared;
+        }
+        itsText += ".\n";
     }
 
     const Compared& itsCompared;

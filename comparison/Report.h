@@ -2,8 +2,8 @@
 #ifndef MORVIK_COMPARISON_REPORT_H
 #define MORVIK_COMPARISON_REPORT_H
 
-#include <optional>
 #include <string>
+#include <vector>
 
 #include "Comparison.h"
 #include "Coverage.h"
@@ -18,9 +18,9 @@ struct Compared {
     const Coverage& coverage;
     const Model& model;
     const Dump& dump;
-    std::string name;                     ///< what messages call the dump
-    bool isPartial;                       ///< the dump may lack values
-    std::optional<std::string> otherRun;  ///< how the model computes the dump as it is, if it does
+    std::string name;                    ///< what messages call the dump
+    bool isPartial;                      ///< the dump may lack values
+    std::vector<std::string> otherRuns;  ///< how the model computes the dump as it is, if it does
 };
 
 /// What is printed.

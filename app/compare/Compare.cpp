@@ -3,8 +3,8 @@
 
 #include <iostream>
 #include <memory>
-#include <optional>
 #include <string>
+#include <vector>
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
@@ -74,10 +74,10 @@ int compare(const Options& options)
     const comparison::Coverage coverage = comparison::coverageOf(model, dump);
     // Few values may agree with another run by chance.
     constexpr std::uint64_t telling = 64;
-    const auto otherRun = found.knownDifferent() > 0 && found.knownCompared() >= telling
-                              ? findOtherRun(run, dump.values)
-                              : std::optional<std::string>();
-    print(comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRun}));
+    const auto otherRuns = found.knownDifferent() > 0 && found.knownCompared() >= telling
+                               ? findOtherRuns(run, dump.values)
+                               : std::vector<std::string>();
+    print(comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRuns}));
     return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
 }
 

@@ -33,41 +33,48 @@ std::optional<std::string> unitsThatFit(ComparedRun run, const comparison::Value
     return units.empty() ? std::nullopt : std::optional(units);
 }
 
-std::optional<std::string> findCore(const ComparedRun& run, const comparison::Values& dump)
+/// Another number of units alone tells more than one with another algorithm.
+std::vector<std::string> findCores(const ComparedRun& run, const comparison::Values& dump)
 {
+    std::vector<std::string> found;
     for (const std::int32_t algorithm : {0, 1, 2}) {
         ComparedRun other = run;
         other.generics.C_ALGORITHM_TYPE = algorithm;
         const auto units = unitsThatFit(other, dump);
         if (units && algorithm == run.generics.C_ALGORITHM_TYPE) {
-            return "with " + *units;
+            return {"with " + *units};
         }
         if (units) {
-            return "with --algorithm " + simulation::algorithmName(static_cast<unsigned>(algorithm)) +
-                   (units->empty() ? "" : " and " + *units);
+            found.push_back("with --algorithm " + simulation::algorithmName(static_cast<unsigned>(algorithm)) +
+                            (units->empty() ? "" : " and " + *units));
         }
     }
-    return std::nullopt;
+    return found;
 }
 
-std::optional<std::string> findBlock(const ComparedRun& run, const comparison::Values& dump)
-try {
+constexpr std::size_t mostBlocks = 4;  ///< that are named
+
+std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Values& dump)
+{
+    std::vector<std::string> found;
     std::error_code ignored;
     if (!std::filesystem::is_regular_file(run.file, ignored)) {
-        return std::nullopt;  // it can be read but once
+        return found;  // it can be read but once
     }
-    InputFile input(run.file);
-    SoftValueReader reader(input.stream(), input.name());
-    SoftBlock block;
-    for (std::uint32_t number = 0; reader.next(block); ++number) {
-        if (number != run.number && block.size() == run.block.size() &&
-            comparison::computesAll(block, run.generics, dump)) {
-            return "of block " + std::to_string(number) + " of " + run.file;
+    try {
+        InputFile input(run.file);
+        SoftValueReader reader(input.stream(), input.name());
+        SoftBlock block;
+        for (std::uint32_t number = 0; reader.next(block) && found.size() < mostBlocks; ++number) {
+            if (number != run.number && block.size() == run.block.size() &&
+                comparison::computesAll(block, run.generics, dump)) {
+                found.push_back("of block " + std::to_string(number) + " of " + run.file);
+            }
         }
+    } catch (const FileError&) {
+        // What follows the block in the file need not be blocks.
     }
-    return std::nullopt;
-} catch (const FileError&) {
-    return std::nullopt;  // what follows the block in the file need not be blocks
+    return found;
 }
 
 /// One mistake at a time, of those that leave a block of this size.
@@ -95,26 +102,27 @@ std::vector<doctor::Mistakes> allMistakes()
     return all;
 }
 
-std::optional<std::string> findMistake(const ComparedRun& run, const comparison::Values& dump)
+std::vector<std::string> findMistakes(const ComparedRun& run, const comparison::Values& dump)
 {
+    std::vector<std::string> found;
     for (const doctor::Mistakes& mistakes : allMistakes()) {
         if (comparison::computesAll(doctor::undone({run.block, {}}, mistakes).received, run.generics, dump)) {
-            return "if, in the block, " + doctor::explain(mistakes).front().what;
+            found.push_back("if, in the block, " + doctor::explain(mistakes).front().what);
         }
     }
-    return std::nullopt;
+    return found;
 }
 
 }  // namespace
 
-std::optional<std::string> findOtherRun(const ComparedRun& run, const comparison::Values& dump)
+std::vector<std::string> findOtherRuns(const ComparedRun& run, const comparison::Values& dump)
 {
-    for (const auto find : {findCore, findBlock, findMistake}) {
-        if (auto found = find(run, dump)) {
-            return found;
-        }
+    std::vector<std::string> found;
+    for (const auto find : {findCores, findBlocks, findMistakes}) {
+        const std::vector<std::string> more = find(run, dump);
+        found.insert(found.end(), more.begin(), more.end());
     }
-    return std::nullopt;
+    return found;
 }
 
 }  // namespace morvik

@@ -3,8 +3,8 @@
 #define MORVIK_OTHERRUNS_H
 
 #include <cstdint>
-#include <optional>
 #include <string>
+#include <vector>
 
 #include "comparison/Values.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
@@ -20,9 +20,9 @@ struct ComparedRun {
     veltra_ip_morvik_v1_0_generics generics;
 };
 
-/// The other core, the other block of the file or the mistake in the block with which the model computes every value of
-/// the dump, as "with --algorithm table"; nothing when there is none.
-std::optional<std::string> findOtherRun(const ComparedRun& run, const comparison::Values& dump);
+/// The other cores, the other blocks of the file and the mistakes in the block with which the model computes every
+/// value of the dump, as "with --algorithm table".
+std::vector<std::string> findOtherRuns(const ComparedRun& run, const comparison::Values& dump);
 
 }  // namespace morvik
 

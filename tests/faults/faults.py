@@ -84,6 +84,55 @@ FAULTS = {
                                                   "forward(MaxStar(Corrections{itsAlphaLUT}), n, g, a)")]),
     "forward_state_swapped": (ENGINE, ENGINE, [
         ("        store(rule, metrics, a[j]);", "        std::swap(metrics[2], metrics[3]);\n        store(rule, metrics, a[j]);")]),
+    "border_six_bits": (SEGMENTS, SEGMENTS, [("arithmetic::borderMask", "-64")]),
+    "border_nine_bits": (SEGMENTS, SEGMENTS, [("arithmetic::borderMask", "-512")]),
+    "border_bit_kept": (SEGMENTS, SEGMENTS, [("arithmetic::borderMask", "-97")]),
+    "forward_border_stale": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);",
+                                                   "starts[u] = h < 2 ? border(reached) : start;")]),
+    "forward_border_late": (SEGMENTS, SEGMENTS, [
+        ("starts[u] = border(reached);",
+         "static std::vector<T8> held[2];\n"
+         "        held[constituent(h)].resize(starts.size());\n"
+         "        starts[u] = u == 0 ? start : h < 2 ? T8{} : held[constituent(h)][u];\n"
+         "        held[constituent(h)][u] = border(reached);")]),
+    "forward_border_early": (SEGMENTS, SEGMENTS, [("const T8 start = starts[u];",
+                                                   "const T8 start = u == 0 || h < 2 ? starts[u] : border(reached);")]),
+    "forward_border_other_code": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);",
+                                                        "itsAlphaInit[1 - constituent(h)][u] = border(reached);")]),
+    "backward_border_stale": (SEGMENTS, SEGMENTS, [("stored = border(reached);",
+                                                    "stored = h < 2 ? border(reached) : stored;")]),
+    "tail_clipped": (SEGMENTS, "Trellis.h", [
+        ("t.x[2] + t.p[2] + t.q[2];", "arithmetic::clip(t.x[2] + t.p[2], -2048, 2032);"),
+        ("t.x[1] + t.p[1] + t.q[1];", "arithmetic::clip(t.x[1] + t.p[1], -2048, 2032);"),
+        ("t.x[1] - t.p[1] + t.q[1];", "arithmetic::clip(t.x[1] - t.p[1], -2048, 2032);"),
+        ("const auto [g0, g1, g2, g3] = branchSums(t.x[0], t.p[0], t.q[0]);",
+         "const Wide g0 = arithmetic::clip(t.x[0] + t.p[0], -2048, 2032), g3 = g0;\n"
+         "    const Wide g1 = arithmetic::clip(t.x[0] - t.p[0], -2048, 2032), g2 = g1;")]),
+    "metrics_stored_in_eleven_bits": (ENGINE, ENGINE, [
+        ("column[state] = rule.stored(metrics[state]);", "column[state] = static_cast<short>(wrap16(2 * rule.stored(metrics[state])) / 2);"),
+        ("store(rule, metrics, a[j]);", "store(rule, metrics, a[j]);\n        metrics = load(rule, a[j]);"),
+        ("store(rule, metrics, *--b);", "store(rule, metrics, *--b);\n        metrics = load(rule, *b);")]),
+    "metrics_kept_in_eleven_bits": (ENGINE, ENGINE, [
+        ("column[state] = rule.stored(metrics[state]);",
+         "column[state] = static_cast<short>(wrap16(2 * rule.stored(metrics[state])) / 2);")]),
+    "metrics_eleven_bits": (ENGINE, "Arithmetic.h", [
+        ("return wrap16(std::int32_t{a} + b);", "return static_cast<Value>(wrap16(2 * (std::int32_t{a} + b)) / 2);"),
+        ("return wrap16(std::int32_t{a} - b);", "return static_cast<Value>(wrap16(2 * (std::int32_t{a} - b)) / 2);")]),
+    "parity_negated_in_eight": (ENGINE, ENGINE, [
+        ("const auto sums = trellis::branchSums<std::int32_t>(2 * intrinsic[k], parity0[k], parity1[k]);",
+         "auto sums = trellis::branchSums<std::int32_t>(2 * intrinsic[k], parity0[k], parity1[k]);\n"
+         "        sums[1] -= parity0[k] == -2048 ? 4096 : 0;\n"
+         "        sums[2] -= parity0[k] == -2048 ? 4096 : 0;")]),
+    "doubled_in_eight": (ENGINE, ENGINE, [
+        ("2 * intrinsic[k], parity0[k]",
+         "16 * static_cast<signed char>(2 * intrinsic[k] / 16), parity0[k]")]),
+    "extrinsic_symmetric": (DECODER, DECODER, [("shiftRight(branch.itsMin, spareBits)",
+                                                "-shiftRight(branch.itsMax, spareBits)")]),
+    "branch_seven_bits": (ENGINE, ENGINE, [("wrap16(arithmetic::clip(sums[i], lo, hi))",
+                                            "wrap16(arithmetic::clip(sums[i], lo / 2, hi / 2 - 8))")]),
+    "one_unit_stuck_bit": (DECODER, DECODER, [
+        ("maskBits(wrap16(extrinsic), mask)",
+         "maskBits(wrap16(j >= 256 && j < 512 ? extrinsic & ~32 : extrinsic), mask)")]),
 }
 
 

@@ -7,6 +7,7 @@
 #include <string>
 
 #include "comparison/Comparison.h"
+#include "comparison/Patterns.h"
 #include "support/Blocks.h"
 
 namespace {
@@ -90,13 +91,46 @@ TEST(Replay, GivesWhatMistakesGive)
     const Model model = modelOf(512, 8, 1, 3);
     const Replay replay(model, model.values);
     // The start column of segment 1 in its second pass, with the bits that a border loses.
-    const Column kept = replay.column(2, Stage::forward, 64, Mistake::borderBitsKept);
+    const Column kept = replay.column(2, Stage::forward, 64, {Mistake::borderMask, -1});
     const Column cleared = replay.column(2, Stage::forward, 64);
     EXPECT_NE(kept.values, cleared.values);
     for (unsigned state = 0; state < 8; ++state) {
         EXPECT_EQ(kept.values[state] & ~7, cleared.values[state]) << state;
     }
     EXPECT_EQ(replay.column(2, Stage::forward, 64, Mistake::borderUnknown).values, Column().values);
+}
+
+TEST(FindShifts, TellsNoneOfValuesThatAreAlikeInAllPasses)
+{
+    blocks::Random random(1);
+    const blocks::Block block = blocks::encode(blocks::randomBits(random, 128), 60);
+    auto generics = veltra_ip_morvik_v1_0_get_default_generics();
+    const Model model = computeModel({block.sys, block.par1, block.par2}, generics, 8, std::cerr);
+    Values dump = model.values;
+    for (const unsigned pass : {0U, 1U, 2U}) {
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            for (unsigned step = 0; step < 128; ++step) {
+                dump.set({pass, signal, step}, 5);
+            }
+        }
+    }
+    // As many values are those of two passes before as are right.
+    EXPECT_TRUE(findShifts(model, dump).empty());
+}
+
+TEST(FindShifts, TellsOfADumpThatIsLate)
+{
+    const Model model = modelOf(128, 2, 1, 4);
+    Values dump(model.values.passes(), model.values.steps());
+    for (unsigned pass = 1; pass < dump.passes(); ++pass) {
+        for (unsigned step = 0; step < 128; ++step) {
+            dump.set({pass, signalsOf(Stage::ratio).first, step},
+                     model.values.at({pass - 1, signalsOf(Stage::ratio).first, step}));
+        }
+    }
+    const auto found = findShifts(model, dump);
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(found.front().find("the dump is a pass late, or counts half-iterations from 1"), 0U) << found.front();
 }
 
 TEST(StepsInOrder, TakeTheSegmentsTogether)

@@ -1,0 +1,211 @@
+// Where: what the places of faults have in common.
+#include "Where.h"
+
+#include <algorithm>
+#include <array>
+
+namespace morvik::comparison {
+
+namespace {
+
+bool startsSegment(const Windows& windows, const Place& place)
+{
+    return stageOf(place.signal) == Stage::forward && place.step < windows.K && place.step % windows.segmentLength == 0;
+}
+
+bool startsWindow(const Windows& windows, const Place& place)
+{
+    return stageOf(place.signal) == Stage::backward && place.step < windows.K &&
+           windows.at(place.step).last == place.step;
+}
+
+bool startsAtTail(const Windows& windows, const Place& place)
+{
+    return startsWindow(windows, place) && place.step + 1 == windows.K;
+}
+
+bool startsInLastRow(const Windows& windows, const Place& place)
+{
+    return windows.rows > 1 && startsWindow(windows, place) && windows.at(place.step).row + 1 == windows.rows;
+}
+
+/// The narrow ones first.
+constexpr std::array<PlaceKind, 8> kinds = {{
+    {"at the beginning of segment 0 alone",
+     [](const Windows& windows, const Place& place) {
+         return startsSegment(windows, place) && place.step == 0;
+     }},
+    {"at window edges alone: where segments start",
+     [](const Windows& windows, const Place& place) {
+         return startsSegment(windows, place) && place.step > 0;
+     }},
+    {"at window edges alone: where segments start, segment 0 among them", startsSegment},
+    {"at the tail alone: where the last window starts", startsAtTail},
+    {"at window edges alone: where windows of the last row start",
+     [](const Windows& windows, const Place& place) {
+         return startsInLastRow(windows, place) && !startsAtTail(windows, place);
+     }},
+    {"at window edges alone: where windows start",
+     [](const Windows& windows, const Place& place) {
+         return startsWindow(windows, place) && !startsAtTail(windows, place);
+     }},
+    {"at window edges alone: where windows start, at the tail as well", startsWindow},
+    {"in the tail alone",
+     [](const Windows& windows, const Place& place) {
+         return place.step >= windows.K;
+     }},
+}};
+
+/// What a property of all faults is, when it is one and the same.
+template <class Property>
+std::optional<unsigned> common(const std::vector<Fault>& faults, Property property)
+{
+    const unsigned first = property(faults.front().place);
+    const bool all =
+        std::all_of(faults.begin(), faults.end(), [&](const Fault& fault) { return property(fault.place) == first; });
+    return all ? std::optional<unsigned>(first) : std::nullopt;
+}
+
+void append(std::string& text, const std::string& part)
+{
+    text += (text.empty() || part.empty() ? "" : ", ") + part;
+}
+
+}  // namespace
+
+Where::Where(const Model& model, const Comparison& comparison, const std::vector<Fault>& faults)
+    : itsModel(&model), itsStage(stageOf(faults.front().place.signal)), itsIsOfOnePass(!comparison.inputsAreKnown)
+{
+    const auto* const kind = std::find_if(kinds.begin(), kinds.end(), [&](const PlaceKind& each) {
+        return std::all_of(
+            faults.begin(), faults.end(), [&](const Fault& fault) { return each.matches(model.windows, fault.place); });
+    });
+    itsKind = kind != kinds.end() ? kind : nullptr;
+    itsPass = common(faults, [](const Place& place) { return place.pass; });
+    itsCode = common(faults, [](const Place& place) { return codeOf(place.pass); });
+    for (const Fault& fault : faults) {
+        itsSignals.set(fault.place.signal);
+    }
+    const auto [fewest, most] = std::minmax_element(
+        faults.begin(), faults.end(), [](const Fault& a, const Fault& b) { return a.place.step < b.place.step; });
+    itsFirst = fewest->place.step;
+    itsLast = most->place.step;
+    itsIsOnePlace = faults.size() == 1;
+    if (itsKind == nullptr && model.windows.segments > 1) {
+        itsSegment = common(faults, [&](const Place& place) { return model.division.placeOf(place.step).segment; });
+        itsUnit = common(faults, [&](const Place& place) { return model.division.placeOf(place.step).unit; });
+    }
+    if (model.division.units() < 2) {
+        itsUnit.reset();
+    }
+    constexpr std::size_t fewestSpread = 8;  // fewer faults are close to each other by chance
+    itsHasRange = itsKind == nullptr && faults.size() >= fewestSpread && 2 * (itsLast - itsFirst + 1) <= stepsAround();
+    const auto [first, count] = signalsOf(itsStage);
+    const auto inDump = std::count_if(comparison.signals.begin() + first,
+                                      comparison.signals.begin() + first + count,
+                                      [](const SignalCount& each) { return each.compared > 0; });
+    if (inDump == 1 || 2 * itsSignals.count() > static_cast<std::size_t>(inDump)) {
+        itsSignals.set();
+    }
+}
+
+unsigned Where::stepsAround() const
+{
+    const Windows& windows = itsModel->windows;
+    return itsSegment ? windows.segmentLength : itsUnit ? windows.K / itsModel->division.units() : windows.K;
+}
+
+bool Where::contains(const Place& place) const
+{
+    if (stageOf(place.signal) != itsStage || !itsSignals.test(place.signal) ||
+        (itsKind != nullptr && !itsKind->matches(itsModel->windows, place)) || (itsPass && *itsPass != place.pass) ||
+        (itsCode && *itsCode != codeOf(place.pass))) {
+        return false;
+    }
+    if ((itsHasRange || itsIsOnePlace) && (place.step < itsFirst || place.step > itsLast)) {
+        return false;
+    }
+    const StepPlace where = itsModel->division.placeOf(place.step);
+    return (!itsSegment || *itsSegment == where.segment) && (!itsUnit || *itsUnit == where.unit);
+}
+
+Where Where::ofBorders() const
+{
+    Where wide = itsIsOnePlace ? spread() : *this;
+    wide.itsSignals.set();
+    wide.itsHasRange = false;
+    return wide;
+}
+
+Where Where::ofOperation() const
+{
+    Where wide = ofBorders();
+    wide.itsKind = nullptr;
+    return wide;
+}
+
+Where Where::spread() const
+{
+    Where wide = *this;
+    wide.itsIsOnePlace = false;
+    wide.itsSegment.reset();
+    wide.itsUnit.reset();
+    if (!itsIsOfOnePass) {
+        wide.itsPass.reset();
+        wide.itsCode.reset();
+    }
+    return wide;
+}
+
+std::string Where::text() const
+{
+    if (itsIsOnePlace) {
+        return "at one place alone";
+    }
+    std::string text = itsKind != nullptr ? itsKind->text : "";
+    append(text, passText());
+    append(text, signalText());
+    append(text, stepText());
+    return text;
+}
+
+/// Faults that are but the differences of the first pass tell nothing of passes.
+std::string Where::passText() const
+{
+    if (itsIsOfOnePass || !itsCode) {
+        return "";
+    }
+    return itsPass         ? "in half-iteration " + std::to_string(*itsPass) + " alone"
+           : *itsCode == 0 ? "on the natural code alone"
+                           : "on the interleaved code alone";
+}
+
+std::string Where::signalText() const
+{
+    if (itsSignals.all()) {
+        return "";
+    }
+    std::string text;
+    std::size_t left = itsSignals.count();
+    for (unsigned signal = 0; signal < signalCount; ++signal) {
+        if (itsSignals.test(signal)) {
+            text += (text.empty() ? "in " : left == 1 ? " and " : ", ") + std::string(passSignals[signal]);
+            --left;
+        }
+    }
+    return text + " alone";
+}
+
+std::string Where::stepText() const
+{
+    if (itsHasRange) {
+        return itsFirst == itsLast
+                   ? "at step " + std::to_string(itsFirst) + " alone"
+                   : "in steps " + std::to_string(itsFirst) + " to " + std::to_string(itsLast) + " alone";
+    }
+    return itsSegment ? "in segment " + std::to_string(*itsSegment) + " alone"
+           : itsUnit  ? "in unit " + std::to_string(*itsUnit) + " alone"
+                      : "";
+}
+
+}  // namespace morvik::comparison
