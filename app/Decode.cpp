@@ -170,6 +170,7 @@ int decode(const Options& options)
     if (reference) {
         reference->expectEnd();
     }
+    std::cerr << coreLine(options.decoder.generics, options.decoder.iterations);
     print(summary, reference.has_value());
     return summary.bitErrors > 0 ? differencesFound : success;
 }

@@ -2,8 +2,21 @@
 #include "DecoderOptions.h"
 
 #include "Arguments.h"
+#include "simulation/Point.h"
 
 namespace morvik {
+
+std::string coreText(const veltra_ip_morvik_v1_0_generics& generics, std::uint32_t iterations)
+{
+    return std::to_string(generics.C_NUM_PU) + " units, " +
+           simulation::algorithmName(static_cast<unsigned>(generics.C_ALGORITHM_TYPE)) + ", " +
+           std::to_string(iterations) + (iterations == 1 ? " iteration" : " iterations");
+}
+
+std::string coreLine(const veltra_ip_morvik_v1_0_generics& generics, std::uint32_t iterations)
+{
+    return "core: " + coreText(generics, iterations) + '\n';
+}
 
 void addDecoderOptions(CLI::App& command, DecoderOptions& options)
 {
@@ -17,7 +30,7 @@ void addDecoderOptions(CLI::App& command, DecoderOptions& options)
                     "0 or max-log: max-log-MAP; 1 or scaled: extrinsic values times 0.75; 2 or table: correction table")
         ->transform(oneOf({{"0", "0"}, {"1", "1"}, {"2", "2"}, {"max-log", "0"}, {"scaled", "1"}, {"table", "2"}}))
         ->type_name("TYPE")
-        ->capture_default_str();
+        ->default_str(simulation::algorithmName(static_cast<unsigned>(options.generics.C_ALGORITHM_TYPE)));
     command.add_option("--iterations", options.iterations, "Turbo iterations, 1 to 15")
         ->transform(integerFrom(1, 15))
         ->type_name("N")

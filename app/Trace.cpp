@@ -121,7 +121,7 @@ std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const Divis
     return trace::tableTrace(std::move(rows), options.block, options.selection);
 }
 
-int run(Options options)
+void write(Options options)
 {
     trace::Selection& selection = options.selection;
     selectPasses(options, selection);
@@ -131,7 +131,7 @@ int run(Options options)
     const SoftBlock block = readBlock(options.input, options.block);
     if (options.format == "text") {
         trace::writeText(block, options.decoder.generics, selection, openOutput(options));
-        return success;
+        return;
     }
     if (selection.signals.empty()) {
         for (const char* const kind : {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"}) {
@@ -148,6 +148,12 @@ int run(Options options)
         }
     }
     writer->finish();
+}
+
+int run(const Options& options)
+{
+    write(options);
+    std::cerr << coreLine(options.decoder.generics, options.decoder.iterations);
     return success;
 }
 

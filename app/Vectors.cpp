@@ -89,19 +89,22 @@ int make(const Options& options)
         throw simulation::Error("--blocks 0 and --no-directed together leave no block");
     }
     manifest.command = commandOf(manifest.settings);
-    print(base::visible(options.output) + ": " + blocksAndFormats(vectors::makeSet(options.output, manifest)) + '\n');
+    const vectors::Manifest made = vectors::makeSet(options.output, manifest);
+    print(coreLine(made.settings.generics, made.settings.iterations) + base::visible(options.output) + ": " +
+          blocksAndFormats(made) + '\n');
     return success;
 }
 
 int check(const std::string& path)
 {
     const vectors::CheckedSet set = vectors::checkSet(path);
-    const std::string folder = base::visible(path);
+    const std::string opening =
+        coreLine(set.manifest.settings.generics, set.manifest.settings.iterations) + base::visible(path) + ": ";
     if (set.difference) {
-        print(folder + ": " + *set.difference + '\n');
+        print(opening + *set.difference + '\n');
         return differencesFound;
     }
-    print(folder + ": " + blocksAndFormats(set.manifest) +
+    print(opening + blocksAndFormats(set.manifest) +
           ", all as the model decodes them: " + comparedText(set.compared) + '\n');
     return success;
 }

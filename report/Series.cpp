@@ -156,17 +156,20 @@ Look lookOf(const std::vector<Curve>& curves, std::size_t curve, const Axis& axi
     const auto before = static_cast<std::size_t>(std::count_if(
         curves.begin(), end, [&drawn](const Curve& other) { return other.reference == drawn.reference; }));
     if (drawn.reference) {
-        return {referenceColour, before % markers, 1 + before % 3, 0};
+        return {referenceColour, before % markers, 1 + before % (dashes - 1), 0};
     }
     const Rank rank = rankOf(curves, curve);
     if (rank.size >= smallestRun) {
-        return {colourIn(rank), before % markers, 0, 0};  // what covers it is of nearly the same colour
+        // What covers it is of nearly the same colour, which alone tells no neighbours apart.
+        return {colourIn(rank), before % markers, before / markers % dashes, 0};
     }
     constexpr std::ptrdiff_t mostLayers = 3;
     const auto layers = std::count_if(
         end + 1, curves.end(), [&](const Curve& above) { return !above.reference && covers(above, drawn, axis); });
-    return {
-        colours[before % colours.size()], before % markers, 0, static_cast<std::size_t>(std::min(layers, mostLayers))};
+    return {colours[before % colours.size()],
+            before % markers,
+            before / colours.size() % dashes,
+            static_cast<std::size_t>(std::min(layers, mostLayers))};
 }
 
 std::vector<Curve> inOrder(const std::vector<Curve>& curves)

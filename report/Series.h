@@ -57,8 +57,8 @@ struct View {
 std::vector<View> viewsOf(const std::vector<Curve>& curves);
 
 /// Colours that tell series apart on white paper and on dark screens, for colour-blind eyes, too: those of M. Okabe and
-/// K. Ito, without the yellow, which white swallows; with the markers, whose number is not a multiple of theirs, they
-/// make 35 series different. References are grey.
+/// K. Ito, without the yellow, which white swallows. Series of the same colour differ in marker, whose number is not a
+/// multiple of that of colours, and in dash. References are grey.
 struct Colour {
     std::string onLight;
     std::string onDark;
@@ -69,8 +69,11 @@ extern const Colour referenceColour;
 /// The number of markers: circle, square, triangle, diamond, pentagon. References have them open.
 constexpr std::size_t markers = 5;
 
+/// The number of dashes, the first of which is solid. References are never solid.
+constexpr std::size_t dashes = 4;
+
 /// A family of at least so many curves has colours that run from one to another, from bright to dark on paper and from
-/// dark to bright on screens.
+/// dark to bright on screens. Neighbours are alike in them, so that marker and dash together tell 20 curves apart.
 constexpr std::size_t smallestRun = 4;
 
 /// How a curve is drawn.

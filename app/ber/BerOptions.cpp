@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "Arguments.h"
+#include "DecoderOptions.h"
 #include "Lists.h"
 #include "Text.h"
 #include "simulation/Error.h"
@@ -177,16 +178,19 @@ std::string realText(double value)
 
 void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
 {
+    const DecoderOptions usual;
+    const auto usualUnits = static_cast<unsigned>(usual.generics.C_NUM_PU);
+    const auto usualAlgorithm = static_cast<unsigned>(usual.generics.C_ALGORITHM_TYPE);
     addListOption(command, "--block-size", sweep.blockSizes, appendBlockSize, "Bits of a block, K")
         ->required()
         ->check(offer(blockSizeWords()))
         ->type_name("K[,K...]");
-    sweep.numPus = {4};
+    sweep.numPus = {usualUnits};
     addListOption(command, "--num-pu", sweep.numPus, appendNumPu, "Parallel processing units: 2, 4 or 8")
         ->check(offer({"2", "4", "8"}))
         ->type_name("N[,N...]")
-        ->default_str("4");
-    sweep.algorithms = {1};
+        ->default_str(std::to_string(usualUnits));
+    sweep.algorithms = {usualAlgorithm};
     addListOption(command,
                   "--algorithm",
                   sweep.algorithms,
@@ -194,7 +198,7 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
                   "0 or max-log: max-log-MAP; 1 or scaled: extrinsic values times 0.75; 2 or table: correction table")
         ->check(offer({"0", "1", "2", "max-log", "scaled", "table"}))
         ->type_name("TYPE[,TYPE...]")
-        ->default_str("scaled");
+        ->default_str(simulation::algorithmName(usualAlgorithm));
     sweep.scaleOptions = {std::nullopt};
     addListOption(command,
                   "--scale",
@@ -204,10 +208,10 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
         ->check(offer({"auto"}))
         ->type_name("X[,X...]")
         ->default_str("auto");
-    sweep.iterations = {8};
+    sweep.iterations = {usual.iterations};
     addListOption(command, "--iterations", sweep.iterations, appendIterations, "Turbo iterations, 1 to 15")
         ->type_name("N[,N...]")
-        ->default_str("8");
+        ->default_str(std::to_string(usual.iterations));
     addListOption(
         command, "--ebn0", sweep.milliDecibels, appendEbn0, "Eb/N0 in dB; by default where the size's rates fall")
         ->type_name("START:STEP:STOP|X[,X...]");

@@ -77,7 +77,8 @@ int compare(const Options& options)
     const auto otherRuns = found.knownDifferent() > 0 && found.knownCompared() >= telling
                                ? findOtherRuns(run, dump.values)
                                : std::vector<std::string>();
-    print(comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRuns}));
+    print(coreLine(run.generics, options.decoder.iterations) +
+          comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRuns}));
     return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
 }
 

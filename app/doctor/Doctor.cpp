@@ -74,7 +74,8 @@ int examine(const Options& options)
     const Cases read = readCases(options);
     doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
     diagnosis.hasMore = read.hasMore;
-    print(options.json ? jsonOf(diagnosis) : textOf(diagnosis));
+    const std::string core = coreLine(options.decoder.generics, options.decoder.iterations);
+    print(options.json ? jsonOf(diagnosis) : core + textOf(diagnosis));
     switch (diagnosis.verdict) {
     case doctor::Verdict::healthy:
         return success;

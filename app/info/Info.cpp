@@ -12,9 +12,11 @@
 
 #include "Arguments.h"
 #include "BlockLayout.h"
+#include "DecoderOptions.h"
 #include "LayoutPicture.h"
 #include "Notice.h"
 #include "report/Plot.h"
+#include "simulation/Point.h"
 #include "standard/BlockSizes.h"
 
 namespace morvik {
@@ -163,12 +165,22 @@ Json jsonOf(const BlockLayout& layout, bool table)
     return object;
 }
 
+Json jsonOf(const DecoderOptions& core)
+{
+    return {{"num_pu", core.generics.C_NUM_PU},
+            {"algorithm", simulation::algorithmName(static_cast<unsigned>(core.generics.C_ALGORITHM_TYPE))},
+            {"tag_width", core.generics.C_TAG_WIDTH},
+            {"iterations", core.iterations}};
+}
+
 std::string generalInformation(const Options& options)
 {
+    const DecoderOptions usual;
     if (!options.json) {
-        return sizesText() + '\n' + textOf(numberFormats());
+        return "Core by default: " + coreText(usual.generics, usual.iterations) + "\n\n" + sizesText() + '\n' +
+               textOf(numberFormats());
     }
-    Json object = {{"block_sizes", Json::array()}};
+    Json object = {{"default_core", jsonOf(usual)}, {"block_sizes", Json::array()}};
     for (const standard::BlockSize& size : standard::blockSizes) {
         object["block_sizes"].push_back({{"block_size", size.K}, {"f1", size.f1}, {"f2", size.f2}});
     }

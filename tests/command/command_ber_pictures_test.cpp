@@ -40,8 +40,8 @@ TEST_F(BerPictures, ShowEachCurveAndTheReferences)
     for (const char* file : {"curves.svg", "report.html"}) {
         SCOPED_TRACE(file);
         const std::string text = morvik.read(file);
-        EXPECT_NE(text.find("K = 40, 4 units, max-log, 8 iterations"), std::string::npos);
-        EXPECT_NE(text.find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
+        EXPECT_NE(text.find("K = 40, 2 units, max-log, 8 iterations"), std::string::npos);
+        EXPECT_NE(text.find("K = 40, 2 units, scaled, 8 iterations"), std::string::npos);
         EXPECT_NE(text.find("another decoder"), std::string::npos);
     }
     EXPECT_EQ(morvik.names(), (std::vector<std::string>{"curves.svg", "other.csv", "report.html"}));
@@ -58,7 +58,7 @@ TEST_F(BerPictures, TellTheCountsAndHowTheRunIsRepeated)
 {
     const std::string rates = berFile(twoCurves + words("--seed 7 --report report.html"));
     const std::string page = withoutTags(morvik.read("report.html"));
-    EXPECT_NE(page.find("morvik ber --block-size 40 --num-pu 4 --algorithm max-log,scaled"), std::string::npos);
+    EXPECT_NE(page.find("morvik ber --block-size 40 --num-pu 2 --algorithm max-log,scaled"), std::string::npos);
     EXPECT_NE(page.find("--seed 7"), std::string::npos);
     const std::vector<CsvRow> rows = csvRows(rates);
     EXPECT_EQ(rows.size(), 4U);
@@ -71,7 +71,7 @@ TEST_F(BerPictures, AreDrawnOfEarlierResultsToo)
 {
     berFile(twoCurves);
     ber(twoCurves + words("--output results.csv --resume --plot again.svg"));
-    EXPECT_NE(morvik.read("again.svg").find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
+    EXPECT_NE(morvik.read("again.svg").find("K = 40, 2 units, scaled, 8 iterations"), std::string::npos);
 }
 
 TEST_F(BerPictures, TakeResultsOfEitherFormatAsReferences)
@@ -80,7 +80,7 @@ TEST_F(BerPictures, TakeResultsOfEitherFormatAsReferences)
     berFile(twoCurves, "before.csv");
     ber(twoCurves + words("--plot a.svg --reference before.json"));
     ber(twoCurves + words("--plot b.svg --reference before.csv"));
-    EXPECT_NE(morvik.read("a.svg").find("before: K = 40, 4 units, max-log, 8 iterations"), std::string::npos);
+    EXPECT_NE(morvik.read("a.svg").find("before: K = 40, 2 units, max-log, 8 iterations"), std::string::npos);
     EXPECT_TRUE(morvik.read("a.svg") == morvik.read("b.svg"));
     morvik.write("bad.json", "{}");
     const CommandResult bad = morvik.run(Arguments{"ber"} + twoCurves + words("--plot c.svg --reference bad.json"));
@@ -155,7 +155,7 @@ TEST_F(MergePictures, ShowTheSumsAndTheReferences)
     merge("a.csv b.csv --output all.csv --plot all.svg --report all.html --reference other.csv");
     for (const char* file : {"all.svg", "all.html"}) {
         SCOPED_TRACE(file);
-        EXPECT_NE(morvik.read(file).find("K = 40, 4 units, scaled, 8 iterations"), std::string::npos);
+        EXPECT_NE(morvik.read(file).find("K = 40, 2 units, scaled, 8 iterations"), std::string::npos);
         EXPECT_NE(morvik.read(file).find("another decoder"), std::string::npos);
     }
     const std::string page = withoutTags(morvik.read("all.html"));

@@ -258,7 +258,7 @@ TEST_F(BerRuns, ResumeNoOtherRun)
     for (const auto& [other, difference] :
          {std::pair("--seed 2", "--seed 1 instead of 2"),
           std::pair("--scale 8", "--scale auto instead of 8"),
-          std::pair("--num-pu 2 --iterations 7", "--iterations 8 instead of 7, --num-pu 4 instead of 2"),
+          std::pair("--num-pu 4 --iterations 7", "--iterations 8 instead of 7, --num-pu 2 instead of 4"),
           std::pair("--block-errors 100000", "without --block-errors"),
           std::pair("--each-iteration", "without --each-iteration")}) {
         expectRefused(again + words(other) + Arguments{"--resume"},
@@ -366,7 +366,7 @@ TEST_F(BerRuns, ThatShareFramesAreNotJoined)
     berFile(run + Arguments{"99:200"}, "b.csv");
     expectRefused(
         {"merge", "a.csv", "b.csv"},
-        "morvik merge: b.csv: has frames that a.csv has, too: K = 40, 4 units, scaled, scale 8, 8 iterations, 0 "
+        "morvik merge: b.csv: has frames that a.csv has, too: K = 40, 2 units, scaled, scale 8, 8 iterations, 0 "
         "dB, frames 99:200");
     berFile(run + Arguments{"100:200", "--seed", "2"}, "b.csv");
     expectRefused({"merge", "a.csv", "b.csv", "--output", "c.csv"},

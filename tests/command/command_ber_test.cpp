@@ -223,12 +223,12 @@ TEST_F(Ber, HasDefaultsForAllButTheSize)
     const auto json = nlohmann::json::parse(morvik.read("a.json"));
     EXPECT_EQ(
         json.at("command"),
-        "morvik ber --block-size 6144 --num-pu 4 --algorithm scaled --scale auto --iterations 8 --block-errors 100 "
+        "morvik ber --block-size 6144 --num-pu 2 --algorithm scaled --scale auto --iterations 8 --block-errors 100 "
         "--max-blocks 2 --stop-bler 1e-04 --seed 1");
     ber(words("--block-size 40 --ebn0 0 --bit-errors 1 --quiet --output a.json --overwrite"));
     EXPECT_EQ(
         nlohmann::json::parse(morvik.read("a.json")).at("command"),
-        "morvik ber --block-size 40 --num-pu 4 --algorithm scaled --scale auto --iterations 8 --ebn0 0 --bit-errors 1 "
+        "morvik ber --block-size 40 --num-pu 2 --algorithm scaled --scale auto --iterations 8 --ebn0 0 --bit-errors 1 "
         "--max-blocks 1000000 --stop-bler 0 --seed 1");
 }
 

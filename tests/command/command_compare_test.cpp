@@ -220,17 +220,19 @@ INSTANTIATE_TEST_SUITE_P(
         FaultCase{"one_unit_stuck_bit", 512, 2, 1, 0, extrinsic, "in unit 1 alone:\n  bit 1 is stuck at 0.\n"}),
     [](const testing::TestParamInfo<FaultCase>& each) { return std::string(each.param.fault); });
 
+const std::string usualCore = "core: 2 units, scaled, 4 iterations\n";
 const std::string allOf1088 =
     "compared 8 of 8 half-iterations, 200280 of 200280 values: all as the model computes them\n";
 
 TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
 {
-    for (const int algorithm : {0, 1, 2}) {
+    int algorithm = 0;
+    for (const std::string name : {"max-log", "scaled", "table"}) {
         writeBlock(1088);
-        writeDump("none", 4, algorithm);
-        const CommandResult result = compare({"--num-pu", "4", "--algorithm", std::to_string(algorithm)});
+        writeDump("none", 4, algorithm++);
+        const CommandResult result = compare({"--num-pu", "4", "--algorithm", name});
         EXPECT_EQ(result.status, 0) << result.out;
-        EXPECT_EQ(result.out, "rtl.csv: " + allOf1088);
+        EXPECT_EQ(result.out, "core: 4 units, " + name + ", 4 iterations\nrtl.csv: " + allOf1088);
         EXPECT_EQ(result.err, "");
     }
 }
@@ -246,7 +248,7 @@ TEST_F(Compare, AgreesWithTheTraceOfTheModel)
         const CommandResult result =
             morvik.run({"compare", "--block", "block.csv", "--iterations", "4", "--dump", file});
         EXPECT_EQ(result.status, 0) << result.out;
-        EXPECT_EQ(result.out, file + ": " + allOf1088);
+        EXPECT_EQ(result.out, usualCore + file + ": " + allOf1088);
     }
 }
 
@@ -456,9 +458,10 @@ TEST_F(Compare, TakesUnknownValuesForDifferences)
     const CommandResult ratios = compare();
     EXPECT_EQ(ratios.status, 1);
     EXPECT_EQ(
-        ratios.out.substr(0, ratios.out.find('\n')),
-        "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: 320 differences, all of them unknown values "
-        "(x)");
+        ratios.out.substr(0, ratios.out.find(" (x)") + 4),
+        usualCore +
+            "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: 320 differences, all of them unknown values "
+            "(x)");
     EXPECT_TRUE(has(ratios.out, "\n  got                 x           x           x\n")) << ratios.out;
     EXPECT_TRUE(has(ratios.out, "\n>         0         202           x *\n")) << ratios.out;
     EXPECT_TRUE(has(ratios.out, "\nllr              320        0      320          320        0   half-iteration 0"))
@@ -488,8 +491,9 @@ TEST_F(Compare, TellsUnknownValuesFromWrongOnes)
     const CommandResult ignored = compare({"--ignore-x"});
     EXPECT_EQ(ignored.status, 0);
     EXPECT_EQ(ignored.out,
-              "rtl.csv: compared 8 of 8 half-iterations, 7446 of 7448 values: all as the model computes them\n"
-              "  ignored: 2 unknown values (x)\n");
+              usualCore +
+                  "rtl.csv: compared 8 of 8 half-iterations, 7446 of 7448 values: all as the model computes them\n"
+                  "  ignored: 2 unknown values (x)\n");
 
     replace("7,3,beta2,", "999");
     morvik.write("rtl.csv", dump);
@@ -511,6 +515,7 @@ TEST_F(Compare, MissesWhatADumpLacks)
         start += ++lines <= 50 ? line + '\n' : "";
     }
     const std::string gaps =
+        usualCore +
         "rtl.csv: compared 8 of 8 half-iterations, 7439 of 7448 values: all as the model computes them\n"
         "  not in the dump: 9 values of beta2, llr; the first is beta2 of half-iteration 0, step 9\n";
     const std::string demand =
@@ -536,8 +541,9 @@ TEST_F(Compare, NeedsNoSignalAsAWhole)
     const CommandResult result = compare();
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.out,
-              "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: all as the model computes them\n"
-              "  not in the dump: signals intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, extrinsic\n");
+              usualCore +
+                  "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: all as the model computes them\n"
+                  "  not in the dump: signals intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, extrinsic\n");
     morvik.write("rtl.csv", "half_iteration,step,llr,g0\n0,0,,\n");
     expectRefused(compare(), "rtl.csv: holds no value that the core computes");
 }

@@ -62,7 +62,8 @@ protected:
     {
         const CommandResult result = trace(arguments);
         EXPECT_EQ(result.status, 0) << result.err;
-        EXPECT_EQ(result.err, "");
+        EXPECT_EQ(result.err.rfind("core: ", 0), 0U) << result.err;
+        EXPECT_EQ(result.err.find('\n'), result.err.size() - 1) << result.err;
         return result.out;
     }
 
@@ -225,7 +226,7 @@ TEST_F(CommandTrace, KeepsWarningsOutOfTables)
         "reported\n";
     const CommandResult table = trace({"wide.csv", "--format", "csv"});
     EXPECT_EQ(table.status, 0);
-    EXPECT_EQ(table.err, warning);
+    EXPECT_EQ(table.err, warning + "core: 2 units, scaled, 8 iterations\n");
     EXPECT_EQ(table.out.find("WARNING"), std::string::npos);
     EXPECT_EQ(traced({"wide.csv"}).rfind(warning, 0), 0U);  // as in the library's trace
 }

@@ -31,14 +31,16 @@ TEST_F(CommandVectors, MakesASetAndChecksIt)
 {
     const CommandResult made = vectors({"--out", "set", "--block-size", "48,40", "--blocks", "2", "--no-directed"});
     EXPECT_EQ(made.status, 0) << made.err;
-    EXPECT_EQ(made.out, "set: 4 blocks in memh\n");
+    const std::string core = "core: 2 units, scaled, 8 iterations\n";
+    EXPECT_EQ(made.out, core + "set: 4 blocks in memh\n");
     const CommandResult checked = vectors({"--check", "set"});
     EXPECT_EQ(checked.status, 0) << checked.err;
-    EXPECT_EQ(
-        checked.out,
-        "set: 4 blocks in memh, all as the model decodes them: 4 tags, 176 decisions, 0 ratios, 0 internal values\n");
+    EXPECT_EQ(checked.out,
+              core +
+                  "set: 4 blocks in memh, all as the model decodes them: 4 tags, 176 decisions, 0 ratios, 0 internal "
+                  "values\n");
     const CommandResult one = vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed"});
-    EXPECT_EQ(one.out, "set: 1 block in memh\n");
+    EXPECT_EQ(one.out, core + "set: 1 block in memh\n");
 }
 
 TEST_F(CommandVectors, WritesWhatDecodeReads)
@@ -111,14 +113,15 @@ TEST_F(CommandVectors, TellsADifference)
 {
     const CommandResult made =
         vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed", "--format", "csv", "--soft"});
-    EXPECT_EQ(made.out, "set: 1 block in csv\n");
+    EXPECT_EQ(made.out, "core: 2 units, scaled, 8 iterations\nset: 1 block in csv\n");
     // Another algorithm gives other ratios.
     auto manifest = nlohmann::json::parse(morvik.read("set/manifest.json"));
     manifest["parameters"]["algorithm"] = "max-log";
     morvik.write("set/manifest.json", manifest.dump());
     const CommandResult checked = vectors({"--check", "set"});
     EXPECT_EQ(checked.status, 1) << checked.err;
-    EXPECT_EQ(checked.out.rfind("set: csv, block 0 (random, K = 40): ratio 0 is ", 0), 0U) << checked.out;
+    const std::string told = "core: 2 units, max-log, 8 iterations\nset: csv, block 0 (random, K = 40): ratio 0 is ";
+    EXPECT_EQ(checked.out.rfind(told, 0), 0U) << checked.out;
 }
 
 TEST_F(CommandVectors, RefusesWhatIsNotAllowed)

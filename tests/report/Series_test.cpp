@@ -5,6 +5,7 @@
 
 #include <set>
 #include <tuple>
+#include <utility>
 
 #include "support/SampleCurves.h"
 
@@ -52,11 +53,34 @@ TEST(Series, ThirtyFiveSeriesLookDifferent)
     std::set<std::tuple<std::string, std::size_t>> looks;
     for (std::size_t i = 0; i < curves.size(); ++i) {
         const Look look = lookOf(curves, i);
-        EXPECT_EQ(look.dash, 0U);
+        EXPECT_LT(look.dash, dashes);
         EXPECT_LT(look.marker, markers);
         looks.emplace(look.colour.onLight, look.marker);
     }
     EXPECT_EQ(looks.size(), curves.size());
+}
+
+TEST(Series, SeriesOfAColourDifferInMarkerAndDash)
+{
+    const std::vector<Curve> curves(28, Curve{"", false, {}});
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        for (std::size_t j = 0; j < i; ++j) {
+            const Look one = lookOf(curves, i);
+            const Look other = lookOf(curves, j);
+            const bool sameColour = one.colour.onLight == other.colour.onLight;
+            EXPECT_FALSE(sameColour && (one.marker == other.marker || one.dash == other.dash)) << i << ' ' << j;
+        }
+    }
+}
+
+TEST(Series, AFamilyIsToldApartWithoutColours)
+{
+    const std::vector<Curve> curves = support::iterationCurves(15, {0, 1});
+    std::set<std::pair<std::size_t, std::size_t>> looks;
+    for (std::size_t i = 0; i < curves.size(); ++i) {
+        looks.emplace(lookOf(curves, i).marker, lookOf(curves, i).dash);
+    }
+    EXPECT_EQ(looks.size(), 15U);
 }
 
 TEST(Series, ReferencesAreGreyAndDashedAndCountOnTheirOwn)

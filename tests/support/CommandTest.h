@@ -30,7 +30,8 @@ std::string withLine(const std::string& text, std::size_t number, const std::str
 /// The path of a file of the test data, whatever the directory of the run.
 std::string vectors(const std::string& file);
 
-/// Whether the text is the summary that begins so and ends in the throughput, and nothing else.
+/// Whether the text is the line of the core and the summary that begins so and ends in the throughput, and nothing
+/// else.
 testing::AssertionResult isSummary(const std::string& text, const std::string& beginning);
 
 /// Has the command at hand, in a directory of its own.

@@ -113,6 +113,10 @@ void addDecode(py::class_<Decoder>& decoder)
 
 void addDecoder(py::module_& module)
 {
+    const veltra_ip_morvik_v1_0_generics usual = veltra_ip_morvik_v1_0_get_default_generics();
+    module.attr("default_num_pu") = usual.C_NUM_PU;
+    module.attr("default_algorithm") = usual.C_ALGORITHM_TYPE;
+    module.attr("default_tag_width") = usual.C_TAG_WIDTH;
     py::register_exception<Refusal>(module, "Error", PyExc_ValueError);
     py::class_<Decoder> decoder(module, "Decoder");
     decoder.def(py::init<std::int32_t, std::int32_t, std::int32_t, std::string>(),

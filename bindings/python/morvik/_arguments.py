@@ -17,6 +17,10 @@ from morvik._errors import Error
 Value = TypeVar("Value")
 
 ALGORITHMS = {"max-log": 0, "scaled": 1, "table": 2}
+DEFAULT_NUM_PU = _core.default_num_pu
+DEFAULT_ALGORITHM = list(ALGORITHMS)[_core.default_algorithm]
+DEFAULT_TAG_WIDTH = _core.default_tag_width
+DEFAULT_ITERATIONS = 8
 TAIL = 4  # positions of a block behind its K others
 _SIZES = frozenset(_core.block_sizes)
 

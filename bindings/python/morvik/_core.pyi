@@ -10,6 +10,9 @@ _Soft = TypeVar("_Soft", np.int8, np.int16, np.int32)
 
 __version__: str
 block_sizes: tuple[int, ...]
+default_num_pu: int
+default_algorithm: int
+default_tag_width: int
 
 class Error(ValueError): ...
 

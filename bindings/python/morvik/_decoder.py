@@ -11,6 +11,10 @@ import numpy.typing as npt
 
 from morvik import _core
 from morvik._arguments import (
+    DEFAULT_ALGORITHM,
+    DEFAULT_ITERATIONS,
+    DEFAULT_NUM_PU,
+    DEFAULT_TAG_WIDTH,
     algorithm_number,
     any_integer,
     expect_block,
@@ -43,7 +47,8 @@ class Decoder:
     """A turbo decoder, bit by bit the hardware core with these generics.
 
     ``num_pu``
-        Parallel processing units: 2, 4 or 8.
+        Parallel processing units: 2, 4 or 8. Like the next two, the library's default when it is not given: 2,
+        ``"scaled"``, 8.
     ``algorithm``
         ``"max-log"``, ``"scaled"`` (extrinsic values times 0.75) or ``"table"`` (correction table); or 0, 1, 2.
     ``tag_width``
@@ -62,9 +67,9 @@ class Decoder:
 
     def __init__(
         self,
-        num_pu: int = 2,
-        algorithm: str | int = "scaled",
-        tag_width: int = 8,
+        num_pu: int = DEFAULT_NUM_PU,
+        algorithm: str | int = DEFAULT_ALGORITHM,
+        tag_width: int = DEFAULT_TAG_WIDTH,
         *,
         threads: int | None = None,
         instruction_set: str | None = None,
@@ -86,7 +91,7 @@ class Decoder:
         sys: npt.ArrayLike,
         par1: npt.ArrayLike,
         par2: npt.ArrayLike,
-        iterations: int = 8,
+        iterations: int = DEFAULT_ITERATIONS,
         tag: npt.ArrayLike = 0,
         *,
         llrs: bool = False,

@@ -9,6 +9,9 @@ import numpy as np
 
 from morvik import _core
 from morvik._arguments import (
+    DEFAULT_ALGORITHM,
+    DEFAULT_ITERATIONS,
+    DEFAULT_NUM_PU,
     algorithm_number,
     block_size as checked_block_size,
     each,
@@ -57,10 +60,10 @@ def error_rate(
     block_size: int | Sequence[int],
     ebn0_db: float | Sequence[float] | None = None,
     *,
-    num_pu: int | Sequence[int] = 4,
-    algorithm: str | int | Sequence[str | int] = "scaled",
+    num_pu: int | Sequence[int] = DEFAULT_NUM_PU,
+    algorithm: str | int | Sequence[str | int] = DEFAULT_ALGORITHM,
     scale: float | None | Sequence[float | None] = None,
-    iterations: int | Sequence[int] = 8,
+    iterations: int | Sequence[int] = DEFAULT_ITERATIONS,
     each_iteration: bool = False,
     block_errors: int | None = None,
     bit_errors: int | None = None,
@@ -84,7 +87,7 @@ def error_rate(
     ``ebn0_db``
         Eb/N0 in dB, -50 to 50 in steps of 0.001; None takes the range where rates of the size fall.
     ``num_pu``, ``algorithm``
-        As for :class:`Decoder`, but that the default is 4 units, as it is for the command.
+        As for :class:`Decoder`, with the same defaults.
     ``scale``
         Steps of a soft value for amplitude 1, above 0 up to 1000; None takes what suits the algorithm.
     ``iterations``

@@ -1,12 +1,14 @@
 """What a decoder takes, returns and refuses."""
 
 import copy
+import inspect
 import pickle
 import warnings
 
 import morvik
 import numpy as np
 import pytest
+from morvik import _core
 
 LARGE = 2**70
 
@@ -340,3 +342,24 @@ def test_truth_values_are_no_numbers(decoder, soft, name):
 def test_soft_values_are_integers(decoder, soft, dtype):
     with pytest.raises(TypeError, match="sys must hold signed integers"):
         decoder.decode(soft.sys.astype(dtype), soft.par1, soft.par2)
+
+
+def test_decoder_and_simulation_have_the_default_of_the_library():
+    core = {
+        "num_pu": _core.default_num_pu,
+        "algorithm": ("max-log", "scaled", "table")[_core.default_algorithm],
+        "tag_width": _core.default_tag_width,
+        "iterations": 8,
+    }
+    assert {name: core[name] for name in ("num_pu", "algorithm", "tag_width")} == {
+        "num_pu": 2,
+        "algorithm": "scaled",
+        "tag_width": 8,
+    }
+    for function in (morvik.Decoder, morvik.Decoder.decode, morvik.error_rate):
+        parameters = inspect.signature(function).parameters
+        given = {name: parameters[name].default for name in core if name in parameters}
+        assert given == {name: core[name] for name in given}
+        assert given
+    rates = morvik.error_rate(40, 0, max_blocks=1)
+    assert (rates.num_pu[0], rates.algorithm[0], rates.iterations[0]) == (2, "scaled", 8)

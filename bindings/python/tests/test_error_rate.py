@@ -47,6 +47,7 @@ def test_scales_are_those_of_the_command(repository):
         np.arange(-0.5, 1.5, 1.0),
         algorithm=2,
         scale=[None, 5, 20.5, 80],
+        num_pu=4,
         iterations=[2, 6],
         max_blocks=100,
         bit_errors=10000,
