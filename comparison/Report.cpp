@@ -17,12 +17,17 @@ constexpr unsigned contextSteps = 3;  // before and behind the first difference
 
 __attribute__((format(printf, 1, 2))) std::string format(const char* form, ...)
 {
-    char buffer[256];
     va_list arguments;
     va_start(arguments, form);
-    std::vsnprintf(buffer, sizeof buffer, form, arguments);
+    va_list again;
+    va_copy(again, arguments);
+    const int length = std::vsnprintf(nullptr, 0, form, arguments);
     va_end(arguments);
-    return buffer;
+    std::string text(static_cast<std::size_t>(std::max(length, 0)) + 1, '\0');
+    std::vsnprintf(text.data(), text.size(), form, again);
+    va_end(again);
+    text.pop_back();
+    return text;
 }
 
 std::string counted(std::uint64_t count, const std::string& noun)
