@@ -81,6 +81,10 @@ private:
 
     void takeColumns(const std::vector<std::string>& names)
     {
+        constexpr std::size_t mostColumns = 1000;
+        if (names.size() > mostColumns) {
+            fail("names " + std::to_string(names.size()) + " columns, there may be " + std::to_string(mostColumns));
+        }
         itsColumns = names;
         for (std::size_t i = 0; i < names.size(); ++i) {
             if (!names[i].empty() && indexOf(names[i]) != i) {
@@ -114,6 +118,7 @@ private:
         Row row;
         row.setting = setting();
         row.sample = sample();
+        checkCounts(row);
         itsRows.push_back(row);
     }
 
@@ -147,7 +152,34 @@ private:
         sample.blockErrors = count("block_errors", UINT64_MAX);
         sample.berBelow = sample.ber == 0 && sample.berHigh > 0;
         sample.blerBelow = sample.bler == 0 && sample.blerHigh > 0;
+        checkBounds("ber", sample.ber, sample.berLow, sample.berHigh);
+        checkBounds("bler", sample.bler, sample.blerLow, sample.blerHigh);
         return sample;
+    }
+
+    /// What is unknown agrees with anything.
+    void checkBounds(const std::string& column, double rate, double low, double high) const
+    {
+        if (low > rate || rate > high || low > high) {
+            fail("the bounds " + column + "_low and " + column + "_high are not around " + column);
+        }
+    }
+
+    void checkCounts(const Row& row) const
+    {
+        const Sample& sample = row.sample;
+        if (sample.blocks == 0) {
+            return;  // unknown
+        }
+        if (sample.blockErrors > sample.blocks) {
+            fail("block_errors " + std::to_string(sample.blockErrors) + " cannot be, of " +
+                 std::to_string(sample.blocks) + " blocks");
+        }
+        const unsigned K = row.setting.blockSize;
+        if (K > 0 && sample.bitErrors > 0 && (sample.bitErrors - 1) / K >= sample.blocks) {
+            fail("bit_errors " + std::to_string(sample.bitErrors) + " cannot be, of " + std::to_string(sample.blocks) +
+                 " blocks of " + std::to_string(K) + " bits");
+        }
     }
 
     std::optional<std::size_t> indexOf(const std::string& column) const

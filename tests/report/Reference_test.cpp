@@ -191,6 +191,19 @@ TEST_F(Reference, RefusesRowsThatDoNotFit)
     expectRefused(header + ",0.5,1\n", ":2: row without a value in the column ebn0_db");
 }
 
+TEST_F(Reference, RefusesValuesThatCannotBe)
+{
+    const std::string header = "ebn0_db,ber,ber_low,ber_high,blocks,bit_errors,block_errors,block_size\n";
+    expectRefused(header + "0,0.1,,,10,,11,40\n", ":2: block_errors 11 cannot be, of 10 blocks");
+    expectRefused(header + "0,0.1,,,10,401,10,40\n", ":2: bit_errors 401 cannot be, of 10 blocks of 40 bits");
+    const std::string bounds = ":2: the bounds ber_low and ber_high are not around ber";
+    expectRefused(header + "0,0.1,0.2,,,,,\n", bounds);
+    expectRefused(header + "0,0.1,,0.05,,,,\n", bounds);
+    expectRefused(header + "0,,0.3,0.2,,,,\n", bounds);
+    expectRefused("ebn0_db,ber" + std::string(999, ',') + '\n', ":1: names 1001 columns, there may be 1000");
+    EXPECT_EQ(read(header + "0,0.1,0.1,0.1,10,400,10,40\n0,0.1,,,,401,11,\n").size(), 2U);
+}
+
 TEST_F(Reference, RefusesValuesThatAreNone)
 {
     const std::string header = "ebn0_db,ber,frames\n";
