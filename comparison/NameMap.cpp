@@ -5,20 +5,21 @@
 #include <array>
 #include <charconv>
 #include <cmath>
-#include <nlohmann/json.hpp>
 #include <system_error>
 #include <utility>
 
 #include "Values.h"
+#include "base/Json.h"
+#include "base/Shown.h"
 #include "simulation/Error.h"
-#include "simulation/Shown.h"
 
 namespace morvik::comparison {
 
 namespace {
 
-using Json = nlohmann::json;
-using simulation::shown;
+using base::Json;
+using base::shown;
+using base::shownValue;
 
 constexpr std::array<std::pair<const char*, NumberForm>, 6> numberForms = {{{"auto", NumberForm::automatic},
                                                                             {"integer", NumberForm::integer},
@@ -113,8 +114,8 @@ private:
     unsigned count(const std::string& key, const Json& value, unsigned first, unsigned last) const
     {
         if (!value.is_number_unsigned() || value.get<std::uint64_t>() < first || value.get<std::uint64_t>() > last) {
-            fail(shown(key) + " is " + value.dump() + ", allowed are the integers " + std::to_string(first) + " to " +
-                 std::to_string(last));
+            fail(shown(key) + " is " + shownValue(value) + ", allowed are the integers " + std::to_string(first) +
+                 " to " + std::to_string(last));
         }
         return value.get<unsigned>();
     }
@@ -126,7 +127,7 @@ private:
                 return kind;
             }
         }
-        fail("\"numbers\" is " + value.dump() + ", allowed are auto, integer, unsigned, real, hex, binary");
+        fail("\"numbers\" is " + shownValue(value) + ", allowed are auto, integer, unsigned, real, hex, binary");
     }
 
     static std::optional<unsigned> signalOf(const Json& name)
@@ -166,7 +167,8 @@ private:
             }
             const auto signal = signalOf(ours);
             if (!signal && !ours.is_null()) {
-                fail("signal " + shown(theirs) + " is " + ours.dump() + ", allowed are " + signalNames + ", and null");
+                fail("signal " + shown(theirs) + " is " + shownValue(ours) + ", allowed are " + signalNames +
+                     ", and null");
             }
             map.signals[theirs] = signal.value_or(NameMap::leftOut);
         }
@@ -205,20 +207,6 @@ private:
     const Json& itsObject;
     std::string itsName;
 };
-
-/// Tells where a text is no JSON: nlohmann counts bytes from the beginning, and one more at the end.
-Json parse(const std::string& text, const std::string& name)
-{
-    try {
-        return Json::parse(text);
-    } catch (const Json::parse_error& error) {
-        const std::string before = text.substr(0, std::max(error.byte, std::size_t{1}) - 1);
-        const auto line = std::count(before.begin(), before.end(), '\n') + 1;
-        const std::size_t character = before.size() - (before.rfind('\n') + 1) + 1;
-        throw simulation::Error(name + ':' + std::to_string(line) + ": no JSON, character " +
-                                std::to_string(character) + " is not expected there");
-    }
-}
 
 }  // namespace
 
@@ -293,7 +281,7 @@ NameMap readNameMap(std::istream& input, const std::string& name)
     if (input.bad()) {
         throw simulation::fileError(name, "read");
     }
-    const Json object = parse(text, name);
+    const Json object = base::parseJson(text, name);
     if (!object.is_object()) {
         throw simulation::Error(name + ": no map, expected a JSON object");
     }

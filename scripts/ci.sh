@@ -15,9 +15,9 @@ stage_format() {
 }
 
 stage_lint() {
-    tidy {src,lanes,base,link,simulation,report,testbench,trace,comparison,vectors,validation,app,bindings}/'*.cpp'
+    tidy {base,src,lanes,link,simulation,report,testbench,trace,comparison,vectors,validation,app,bindings}/'*.cpp'
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
-        --suppress=internalAstError -I include -I src -I . src base link simulation report testbench trace comparison vectors validation app
+        --suppress=internalAstError -I include -I src -I . base src link simulation report testbench trace comparison vectors validation app
 }
 
 # Takes as long again as the rest.

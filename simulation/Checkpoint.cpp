@@ -4,14 +4,18 @@
 #include <array>
 #include <charconv>
 #include <cstdint>
-#include <nlohmann/json.hpp>
 #include <string_view>
+
+#include "Error.h"
+#include "Possible.h"
+#include "base/Json.h"
 
 namespace simulation {
 
 namespace {
 
-using Json = nlohmann::json;
+using base::Json;
+using base::JsonMembers;
 
 constexpr std::string_view opening = "morvik checkpoint ";
 
@@ -44,41 +48,75 @@ Json jsonOf(const PointResult& point)
             {"errors", errors}};
 }
 
-PointResult pointOf(const Json& json)
+ErrorCounts countsOf(const JsonMembers& members)
 {
+    ErrorCounts counts;
+    counts.bitErrors = members.integer("bit_errors", 0, UINT64_MAX);
+    counts.blockErrors = members.integer("block_errors", 0, UINT64_MAX);
+    counts.bitErrorSquares = members.integer("bit_error_squares", 0, UINT64_MAX);
+    for (const Json& frame : members.list("failures")) {
+        if (!frame.is_number_unsigned() || counts.failures.size() == ErrorCounts::keptFailures) {
+            members.refuse("failures",
+                           "allowed are " + std::to_string(ErrorCounts::keptFailures) + " numbers of frames at most");
+        }
+        counts.failures.push_back(frame.get<std::uint64_t>());
+    }
+    return counts;
+}
+
+PointResult pointOf(const Json& json, const std::string& place)
+{
+    const JsonMembers members(json, place);
     PointResult point;
-    json.at("number").get_to(point.number);
-    json.at("seconds").get_to(point.seconds);
-    json.at("blocks").get_to(point.tally.blocks);
-    json.at("clipped").get_to(point.tally.clipped);
+    point.number = static_cast<std::size_t>(members.integer("number", 0, UINT32_MAX));
+    point.seconds = members.number("seconds");
+    if (!isPossibleTime(point.seconds)) {
+        members.refuse("seconds", "which is no time of a run");
+    }
+    point.tally.blocks = members.integer("blocks", 0, mostBlocks);
+    point.tally.clipped = members.integer("clipped", 0, UINT64_MAX);
     point.tally.errors.clear();
-    for (const Json& errors : json.at("errors")) {
-        ErrorCounts counts;
-        errors.at("bit_errors").get_to(counts.bitErrors);
-        errors.at("block_errors").get_to(counts.blockErrors);
-        errors.at("bit_error_squares").get_to(counts.bitErrorSquares);
-        errors.at("failures").get_to(counts.failures);
-        point.tally.errors.push_back(counts);
+    for (const Json& errors : members.list("errors")) {
+        point.tally.errors.push_back(countsOf({errors, place + ": errors"}));
     }
     return point;
+}
+
+std::vector<PointResult> pointsOf(const JsonMembers& members, const std::string& name, const std::string& fileName)
+{
+    const std::string place = fileName + ": " + name + ' ';
+    std::vector<PointResult> points;
+    for (const Json& point : members.list(name)) {
+        points.push_back(pointOf(point, place + std::to_string(points.size() + 1)));
+    }
+    return points;
+}
+
+Json jsonOf(const std::vector<PointResult>& points)
+{
+    Json list = Json::array();
+    for (const PointResult& point : points) {
+        list.push_back(jsonOf(point));
+    }
+    return list;
 }
 
 }  // namespace
 
 std::string checkpointText(const Checkpoint& checkpoint)
 {
-    Json json = {{"version", checkpoint.version}, {"command", checkpoint.command}, {"ended", Json::array()}};
-    for (const PointResult& point : checkpoint.ended) {
-        json["ended"].push_back(jsonOf(point));
-    }
+    Json json = {{"version", checkpoint.version},
+                 {"command", checkpoint.command},
+                 {"ended", jsonOf(checkpoint.ended)},
+                 {"begun", jsonOf(checkpoint.begun)}};
     if (checkpoint.running) {
         json["running"] = jsonOf(*checkpoint.running);
     }
-    const std::string body = json.dump(1) + '\n';
+    const std::string body = json.dump(1, ' ', false, Json::error_handler_t::replace) + '\n';
     return std::string(opening) + checksum(body) + '\n' + body;
 }
 
-std::optional<Checkpoint> parseCheckpoint(const std::string& text)
+std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::string& fileName)
 {
     const std::size_t lineEnd = text.find('\n');
     if (lineEnd == std::string::npos) {
@@ -88,15 +126,15 @@ std::optional<Checkpoint> parseCheckpoint(const std::string& text)
     if (text.substr(0, lineEnd) != std::string(opening) + checksum(body)) {
         return std::nullopt;
     }
-    const Json json = Json::parse(body);
+    const Json json = base::parseJson('\n' + body, fileName);  // with the lines as in the file
+    const JsonMembers members(json, fileName);
     Checkpoint checkpoint;
-    json.at("version").get_to(checkpoint.version);
-    json.at("command").get_to(checkpoint.command);
-    for (const Json& point : json.at("ended")) {
-        checkpoint.ended.push_back(pointOf(point));
-    }
-    if (json.contains("running")) {
-        checkpoint.running = pointOf(json["running"]);
+    checkpoint.version = members.text("version");
+    checkpoint.command = members.text("command");
+    checkpoint.ended = pointsOf(members, "ended", fileName);
+    checkpoint.begun = pointsOf(members, "begun", fileName);
+    if (members.has("running")) {
+        checkpoint.running = pointOf(members.at("running"), fileName + ": running");
     }
     return checkpoint;
 }

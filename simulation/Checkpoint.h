@@ -15,13 +15,15 @@ struct Checkpoint {
     std::string command;
     std::vector<PointResult> ended;
     std::optional<PointResult> running;
+    std::vector<PointResult> begun;  // later points, which an earlier run with smaller limits has counted
 };
 
 /// The text, which opens with a checksum.
 std::string checkpointText(const Checkpoint& checkpoint);
 
-/// What checkpointText() has written; nothing if the text was damaged.
-std::optional<Checkpoint> parseCheckpoint(const std::string& text);
+/// What checkpointText() has written; nothing if the text was damaged. Throws Error that opens with the file's name
+/// when the checksum is right, but the rest is no checkpoint.
+std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::string& fileName);
 
 }  // namespace simulation
 

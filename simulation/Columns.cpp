@@ -8,6 +8,7 @@
 #include <optional>
 #include <system_error>
 
+#include "Possible.h"
 #include "Thousandths.h"
 #include "standard/BlockSizes.h"
 
@@ -67,7 +68,7 @@ bool readScaleOption(std::string_view text, ResultRow& row)
 
 bool readSeconds(std::string_view text, ResultRow& row)
 {
-    return readNumber(text, row.seconds) && row.seconds >= 0;
+    return readNumber(text, row.seconds) && isPossibleTime(row.seconds);
 }
 
 std::string failuresText(const ResultRow& row)
@@ -165,11 +166,18 @@ const std::vector<Column> allColumns = {
      [](Text field, Row& row) { return readNumber(field, row.seed); }},
     {"version", text,
      [](const Row& row) { return row.version; },
-     [](Text field, Row& row) { row.version = field; return !field.empty(); }},
+     [](Text field, Row& row) { row.version = field; return isVersion(field); }},
 };
 // clang-format on
 
 }  // namespace
+
+bool isVersion(std::string_view text)
+{
+    constexpr std::size_t longest = 64;
+    return !text.empty() && text.size() <= longest &&
+           std::all_of(text.begin(), text.end(), [](char c) { return c > ' ' && c <= '~' && c != ',' && c != '"'; });
+}
 
 const std::vector<Column>& columns()
 {

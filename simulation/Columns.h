@@ -20,6 +20,9 @@ struct Column {
     bool (*read)(std::string_view text, ResultRow& row);  // false if the text cannot stand here
 };
 
+/// Whether the text can be a version: short, printable, and a field of CSV as it is.
+bool isVersion(std::string_view text);
+
 /// All columns, in their order. Rates and bounds are written for the reader's sake; reading computes them anew.
 const std::vector<Column>& columns();
 

@@ -6,6 +6,7 @@
 #include <charconv>
 #include <numeric>
 #include <system_error>
+#include <utility>
 
 namespace simulation {
 
@@ -20,6 +21,23 @@ std::optional<std::uint64_t> parseNumber(std::string_view text)
         return std::nullopt;
     }
     return value;
+}
+
+/// The ranges in ascending order, neighbours as one; nothing if some have a frame in common.
+std::optional<std::vector<FrameRange>> joinedRanges(std::vector<FrameRange> all)
+{
+    std::sort(all.begin(), all.end(), [](const FrameRange& a, const FrameRange& b) { return a.from < b.from; });
+    std::vector<FrameRange> joined;
+    for (const FrameRange& range : all) {
+        if (joined.empty() || joined.back().to < range.from) {
+            joined.push_back(range);
+        } else if (joined.back().to == range.from) {
+            joined.back().to = range.to;
+        } else {
+            return std::nullopt;
+        }
+    }
+    return joined;
 }
 
 }  // namespace
@@ -49,19 +67,18 @@ bool FrameSet::join(const FrameSet& other)
 {
     std::vector<FrameRange> all = itsRanges;
     all.insert(all.end(), other.itsRanges.begin(), other.itsRanges.end());
-    std::sort(all.begin(), all.end(), [](const FrameRange& a, const FrameRange& b) { return a.from < b.from; });
-    std::vector<FrameRange> joined;
-    for (const FrameRange& range : all) {
-        if (joined.empty() || joined.back().to < range.from) {
-            joined.push_back(range);
-        } else if (joined.back().to == range.from) {
-            joined.back().to = range.to;
-        } else {
-            return false;
-        }
+    auto joined = joinedRanges(std::move(all));
+    if (joined) {
+        itsRanges = *std::move(joined);
     }
-    itsRanges = joined;
-    return true;
+    return joined.has_value();
+}
+
+bool FrameSet::has(std::uint64_t frame) const
+{
+    return std::any_of(itsRanges.begin(), itsRanges.end(), [frame](const FrameRange& range) {
+        return range.from <= frame && frame < range.to;
+    });
 }
 
 std::uint64_t FrameSet::size() const
@@ -88,15 +105,22 @@ std::string FrameSet::text() const
 
 std::optional<FrameSet> FrameSet::parse(std::string_view text)
 {
-    FrameSet frames;
+    std::vector<FrameRange> ranges;
     while (!text.empty()) {
         const std::string_view first = text.substr(0, text.find(' '));
         const auto range = parseFrameRange(first);
-        if (!range || !frames.join(FrameSet(*range))) {
+        if (!range) {
             return std::nullopt;
         }
+        ranges.push_back(*range);
         text.remove_prefix(std::min(first.size() + 1, text.size()));
     }
+    auto joined = joinedRanges(std::move(ranges));
+    if (!joined) {
+        return std::nullopt;
+    }
+    FrameSet frames;
+    frames.itsRanges = *std::move(joined);
     return frames;
 }
 

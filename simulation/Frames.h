@@ -34,6 +34,9 @@ public:
     /// Adds the frames of the other; refuses, and returns false, if both have some frame.
     bool join(const FrameSet& other);
 
+    /// Whether a frame is among them.
+    bool has(std::uint64_t frame) const;
+
     /// How many frames there are.
     std::uint64_t size() const;
 

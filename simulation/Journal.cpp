@@ -1,15 +1,18 @@
 // Journal: what a run has counted, kept in memory and on the disk.
 #include "Journal.h"
 
+#include <algorithm>
 #include <filesystem>
 #include <system_error>
 #include <utility>
 
-#include "CompleteResults.h"
 #include "Error.h"
 #include "ResultFiles.h"
+#include "Resumption.h"
 #include "TextFile.h"
+#include "base/Json.h"
 #include "base/OutputFile.h"
+#include "base/Shown.h"
 
 namespace simulation {
 
@@ -24,7 +27,7 @@ bool hasContent(const std::string& fileName)
 }  // namespace
 
 Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
-    : itsPlan(plan), itsOutput(std::move(output)), itsCheckpoint{plan.version, plan.command, {}, {}}
+    : itsPlan(plan), itsOutput(std::move(output)), itsCheckpoint{plan.version, base::asUtf8(plan.command), {}, {}, {}}
 {
     if (itsOutput.empty()) {
         return;
@@ -40,10 +43,11 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     const bool hasResults = hasContent(itsOutput);
     if (earlier == Earlier::refuse) {
         refuseIf(isUnfinished, hasResults);
-    } else if (earlier == Earlier::resume && isUnfinished) {
-        resume(checkpointFile);
-    } else if (earlier == Earlier::resume && hasResults) {
-        takeComplete();
+    } else if (earlier == Earlier::resume && (isUnfinished || hasResults)) {
+        Standing standing = isUnfinished ? standingOf(plan, resumable(checkpointFile), checkpointFile)
+                                         : standingOf(plan, readResults(itsOutput), itsOutput);
+        itsCheckpoint.ended = std::move(standing.ended);
+        itsCheckpoint.begun = std::move(standing.begun);
     }
 }
 
@@ -54,7 +58,7 @@ void Journal::begin()
 
 bool Journal::isEmpty() const
 {
-    return itsCheckpoint.ended.empty() && !itsCheckpoint.running;
+    return itsCheckpoint.ended.empty() && !itsCheckpoint.running && itsCheckpoint.begun.empty();
 }
 
 const std::vector<PointResult>& Journal::ended() const
@@ -67,6 +71,12 @@ PointResult Journal::resultSoFar(std::size_t point) const
     if (itsCheckpoint.running && itsCheckpoint.running->number == point) {
         return *itsCheckpoint.running;
     }
+    const auto& begun = itsCheckpoint.begun;
+    const auto found =
+        std::find_if(begun.begin(), begun.end(), [point](const PointResult& each) { return each.number == point; });
+    if (found != begun.end()) {
+        return *found;
+    }
     return {point, Tally(itsPlan.countsOf(itsPlan.points[point])), 0};
 }
 
@@ -74,11 +84,15 @@ void Journal::end(const PointResult& point)
 {
     itsCheckpoint.ended.push_back(point);
     itsCheckpoint.running.reset();
+    forgetBegun(point.number);
 }
 
 void Journal::save(const std::optional<PointResult>& running)
 {
     itsCheckpoint.running = running;
+    if (running) {
+        forgetBegun(running->number);
+    }
     if (!itsFile) {
         return;
     }
@@ -112,34 +126,31 @@ void Journal::refuseIf(bool isUnfinished, bool hasResults) const
     }
 }
 
-void Journal::resume(const std::string& checkpointFile)
+Checkpoint Journal::resumable(const std::string& checkpointFile) const
 {
-    const auto checkpoint = parseCheckpoint(readText(checkpointFile));
+    const auto checkpoint = parseCheckpoint(readText(checkpointFile), checkpointFile);
     if (!checkpoint) {
         throw Error(checkpointFile + ": is damaged and cannot be resumed; --overwrite starts anew");
     }
     if (checkpoint->version != itsPlan.version) {
-        throw Error(checkpointFile + ": holds a run of version " + checkpoint->version + ", this is " +
-                    itsPlan.version);
+        throw Error(checkpointFile + ": holds a run of version " + base::shown(checkpoint->version) + ", this is " +
+                    itsPlan.version + "; --overwrite starts anew");
     }
-    if (checkpoint->command != itsPlan.command) {
-        throw Error(checkpointFile +
-                    ": holds a run with other parameters: " + differenceOf(checkpoint->command, itsPlan.command));
+    const std::string obstacles = obstaclesBetween(checkpoint->command, itsCheckpoint.command);
+    if (!obstacles.empty()) {
+        throw Error(checkpointFile + ": holds a run with other parameters: " + obstacles +
+                    "; nothing but limits may change, which may grow; --overwrite starts anew");
     }
-    itsCheckpoint = *checkpoint;
+    return *checkpoint;
 }
 
-void Journal::takeComplete()
+/// Forgets what an earlier run has counted of the points up to that one.
+void Journal::forgetBegun(std::size_t last)
 {
-    const Results results = readResults(itsOutput);
-    const auto points = pointsOfComplete(itsPlan, results);
-    if (!points) {
-        const std::string difference =
-            results.command.empty() ? "" : differenceOf(results.command, itsPlan.command);  // CSV does not tell
-        throw Error(itsOutput + ": holds other results" + (difference.empty() ? "" : " (" + difference + ')') +
-                    ", and there is no checkpoint to resume; --overwrite starts anew");
-    }
-    itsCheckpoint.ended = *points;
+    auto& begun = itsCheckpoint.begun;
+    begun.erase(begun.begin(), std::find_if(begun.begin(), begun.end(), [last](const PointResult& each) {
+                    return each.number > last;
+                }));
 }
 
 }  // namespace simulation

@@ -18,7 +18,8 @@ namespace simulation {
 class Journal {
 public:
     /// What becomes of an earlier run: its checkpoint or its results are in the way, this run goes on from them, or
-    /// takes their place. A complete run has no checkpoint, but results; going on from there, nothing is left to do.
+    /// takes their place. A complete run has no checkpoint, but results; going on from there, nothing is left to do,
+    /// unless this run has larger limits.
     enum class Earlier { refuse, resume, overwrite };
 
     /// Opens the journal, for no other run to open it, too, and finds out whether it can be kept. Without an output it
@@ -51,8 +52,8 @@ public:
 
 private:
     void refuseIf(bool isUnfinished, bool hasResults) const;
-    void resume(const std::string& checkpointFile);
-    void takeComplete();
+    Checkpoint resumable(const std::string& checkpointFile) const;
+    void forgetBegun(std::size_t last);
 
     const Plan& itsPlan;
     std::string itsOutput;

@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "Error.h"
+#include "Possible.h"
 #include "Thousandths.h"
 
 namespace simulation {
@@ -71,9 +72,15 @@ void join(const Part& part, const ResultRow& row, JoinedRow& joined)
         throw Error(part.fileName + ": has frames that " + *joined.file + " has, too: " + nameOf(row.point) +
                     ", frames " + row.frames.text());
     }
-    joined.row.errors.add(row.errors);
+    ErrorCounts& errors = joined.row.errors;
+    const bool isTooMuch = row.errors.bitErrorSquares > UINT64_MAX - errors.bitErrorSquares;
+    errors.add(row.errors);
     joined.row.clipped += row.clipped;
     joined.row.seconds += row.seconds;
+    if (isTooMuch || joined.row.frames.size() > mostBlocks) {
+        throw Error(part.fileName + ": has more errors or blocks, together with " + *joined.file +
+                    ", than can be counted: " + nameOf(row.point));
+    }
 }
 
 /// The parameters of the point that a row belongs to: rows after different iterations of it share the number.

@@ -2,12 +2,16 @@
 #include "Plan.h"
 
 #include <algorithm>
+#include <charconv>
 #include <cmath>
 #include <initializer_list>
 #include <map>
+#include <optional>
 #include <sstream>
 #include <string_view>
+#include <system_error>
 
+#include "base/Shown.h"
 #include "link/DefaultScale.h"
 
 namespace simulation {
@@ -71,6 +75,43 @@ std::map<std::string, std::string> optionsOf(const std::string& command)
     return options;
 }
 
+template <class Number>
+std::optional<Number> parsed(std::string_view text)
+{
+    Number value{};
+    const char* const end = text.data() + text.size();
+    const auto result = std::from_chars(text.data(), end, value);
+    return result.ec == std::errc() && result.ptr == end ? std::optional<Number>(value) : std::nullopt;
+}
+
+template <class Number>
+bool isNoLess(const std::string& now, const std::string& before)
+{
+    const auto limit = parsed<Number>(now);
+    const auto earlier = parsed<Number>(before);
+    return limit && earlier && *limit >= *earlier;
+}
+
+/// Whether what an option has allowed before is allowed by the value that it has now, or by its absence.
+bool isWithin(const std::string& option, const std::string& before, const std::optional<std::string>& now)
+{
+    if (now == before) {
+        return true;
+    }
+    if (option == "--block-errors" || option == "--bit-errors" || option == "--max-blocks") {
+        return !now || isNoLess<std::uint64_t>(*now, before);
+    }
+    if (option == "--max-time") {
+        return !now || isNoLess<double>(*now, before);
+    }
+    if (option == "--frames") {
+        const auto frames = parseFrameRange(now.value_or("0:" + std::to_string(UINT64_MAX)));
+        const auto earlier = parseFrameRange(before);
+        return frames && earlier && frames->from == earlier->from && frames->to >= earlier->to;
+    }
+    return false;
+}
+
 }  // namespace
 
 std::vector<int> usualMilliDecibels(unsigned K)
@@ -79,6 +120,20 @@ std::vector<int> usualMilliDecibels(unsigned K)
         return range(0, 500, 6000);
     }
     return K <= 1024 ? range(0, 200, 3000) : range(0, 100, 1500);
+}
+
+std::uint64_t countOfPoints(const Sweep& sweep)
+{
+    std::uint64_t decibels = 0;
+    for (const unsigned K : sweep.blockSizes) {
+        decibels += milliDecibelsOf(sweep, usualMilliDecibels(K)).size();
+    }
+    std::uint64_t count = decibels;
+    for (const std::size_t values :
+         {sweep.numPus.size(), sweep.algorithms.size(), sweep.scaleOptions.size(), sweep.iterations.size()}) {
+        count *= values;
+    }
+    return count;
 }
 
 std::vector<Point> pointsOf(const Sweep& sweep)
@@ -103,40 +158,60 @@ std::vector<Point> pointsOf(const Sweep& sweep)
     return points;
 }
 
-std::string differenceOf(const std::string& command, const std::string& other)
+std::string obstaclesBetween(const std::string& before, const std::string& now)
 {
-    const auto ours = optionsOf(command);
-    const auto theirs = optionsOf(other);
+    const auto earlier = optionsOf(before);
+    const auto present = optionsOf(now);
     std::string text;
     const auto append = [&text](std::initializer_list<std::string_view> parts) {
-        text += text.empty() ? "" : ", ";
+        std::string whole;
         for (const std::string_view part : parts) {
-            text += part;
+            whole += part;
         }
+        constexpr std::size_t longest = 80;
+        text += (text.empty() ? "" : ", ") + base::shortened(whole, longest);
     };
-    for (const auto& [option, value] : ours) {
-        const auto found = theirs.find(option);
-        if (found == theirs.end()) {
-            append({option, value.empty() ? "" : " ", value});
-        } else if (found->second != value) {
+    for (const auto& [option, value] : earlier) {
+        const auto found = present.find(option);
+        if (found == present.end()) {
+            if (!isWithin(option, value, std::nullopt)) {
+                append({option, value.empty() ? "" : " ", value});
+            }
+        } else if (!isWithin(option, value, found->second)) {
             append({option, " ", value, " instead of ", found->second});
         }
     }
-    for (const auto& [option, value] : theirs) {
-        if (ours.count(option) == 0) {
+    for (const auto& [option, value] : present) {
+        if (earlier.count(option) == 0) {
             append({"without ", option});
         }
     }
-    return text;
+    constexpr std::size_t longest = 400;
+    return base::shortened(text, longest);
 }
 
 bool isCurveEnded(const Plan& plan, std::size_t point, const std::vector<PointResult>& earlier)
 {
-    return std::any_of(earlier.begin(), earlier.end(), [&](const PointResult& result) {
-        const auto blockErrors = static_cast<double>(result.tally.errors.back().blockErrors);
-        return onSameCurve(plan.points[result.number], plan.points[point]) &&
-               blockErrors < plan.rules.stopBler * static_cast<double>(result.tally.blocks);
-    });
+    if (plan.rules.stopBler <= 0) {
+        return false;
+    }
+    const auto isOther = [&](const PointResult& result) {
+        return !onSameCurve(plan.points[result.number], plan.points[point]);
+    };
+    return std::any_of(
+        earlier.rbegin(), std::find_if(earlier.rbegin(), earlier.rend(), isOther), [&](const PointResult& result) {
+            const auto blockErrors = static_cast<double>(result.tally.errors.back().blockErrors);
+            return blockErrors < plan.rules.stopBler * static_cast<double>(result.tally.blocks);
+        });
+}
+
+std::size_t nextPoint(const Plan& plan, const std::vector<PointResult>& earlier)
+{
+    std::size_t point = earlier.empty() ? 0 : earlier.back().number + 1;
+    while (point < plan.points.size() && isCurveEnded(plan, point, earlier)) {
+        ++point;
+    }
+    return point;
 }
 
 Results resultsOf(const Plan& plan, const std::vector<PointResult>& points)

@@ -29,6 +29,9 @@ struct Sweep {
 /// The Eb/N0 in which the error rates of blocks of K bits fall, in thousandths of a decibel.
 std::vector<int> usualMilliDecibels(unsigned K);
 
+/// How many points a sweep has.
+std::uint64_t countOfPoints(const Sweep& sweep);
+
 /// The points in the order of results.
 std::vector<Point> pointsOf(const Sweep& sweep);
 
@@ -55,9 +58,10 @@ struct Plan {
     }
 };
 
-/// Which options of one command are not those of the other, both as plans have them: "--seed 1 instead of 2, without
-/// --each-iteration".
-std::string differenceOf(const std::string& command, const std::string& other);
+/// What keeps a run with the command `now` from going on with what one with the command `before` has counted, both as
+/// plans have them: "--seed 1 instead of 2, without --each-iteration". Empty if nothing does: the options are the same,
+/// or those that differ are limits of points, none of which is smaller than before.
+std::string obstaclesBetween(const std::string& before, const std::string& now);
 
 /// What has been counted at a point of a plan.
 struct PointResult {
@@ -66,8 +70,13 @@ struct PointResult {
     double seconds = 0;
 };
 
-/// Whether an earlier point of the curve has a block error rate below the one that ends curves.
+/// Whether an earlier point of the curve has a block error rate below the one that ends curves. All earlier points are
+/// in the order of the plan.
 bool isCurveEnded(const Plan& plan, std::size_t point, const std::vector<PointResult>& earlier);
+
+/// The first point behind the earlier ones that is simulated: whose curve has not ended. The number of points if none
+/// is.
+std::size_t nextPoint(const Plan& plan, const std::vector<PointResult>& earlier);
 
 /// The rows of all points.
 Results resultsOf(const Plan& plan, const std::vector<PointResult>& points);

@@ -2,16 +2,17 @@
 #include "ResultFiles.h"
 
 #include <algorithm>
-#include <nlohmann/json.hpp>
 #include <sstream>
 #include <string_view>
 #include <vector>
 
 #include "Columns.h"
 #include "Error.h"
+#include "Possible.h"
 #include "Shown.h"
 #include "TextFile.h"
 #include "base/Csv.h"
+#include "base/Json.h"
 #include "base/OutputFile.h"
 
 namespace simulation {
@@ -40,18 +41,11 @@ void readField(const Column& column, const std::string& text, ResultRow& row, co
     }
 }
 
-/// Throws Error unless the row's numbers of errors are possible, so that rates and bounds can be computed.
+/// Throws Error unless the row's numbers are possible, so that rates and bounds can be computed.
 void checkCounts(const ResultRow& row, const std::string& place)
 {
-    const ErrorCounts& errors = row.errors;
-    const std::uint64_t blocks = row.frames.size();
-    constexpr std::uint64_t mostBlocks = std::uint64_t{1} << 48;  // years of work, and products stay within 64 bits
-    const std::uint64_t bits = blocks * row.point.blockSize;
-    if (blocks > mostBlocks || row.clipped > 3 * (bits + 4 * blocks) ||
-        errors.bitErrorSquares / row.point.blockSize > errors.bitErrors || errors.blockErrors > blocks ||
-        errors.bitErrors < errors.blockErrors || errors.bitErrors > bits || errors.bitErrorSquares < errors.bitErrors ||
-        errors.failures.size() > errors.blockErrors) {
-        throw Error(place + ": numbers of errors that cannot be");
+    if (const auto wrong = impossibleCount(row.frames, row.point.blockSize, row.errors, row.clipped)) {
+        throw Error(place + ": " + *wrong);
     }
 }
 
@@ -97,48 +91,48 @@ Results parseCsv(const std::string& text, const std::string& fileName)
 }
 
 /// A row's value as the text of its column.
-std::string jsonField(const nlohmann::json& value, Column::Kind kind)
+std::string jsonField(const base::JsonMembers& row, const Column& column)
 {
-    if (kind == Column::Kind::text) {
-        return value.get<std::string>();
+    const std::string name(column.name);
+    if (column.kind == Column::Kind::text) {
+        return row.text(name);
     }
-    if (kind == Column::Kind::number) {
-        return value.is_number() ? value.dump() : "";
+    if (column.kind == Column::Kind::number) {
+        row.number(name);
+        return row.at(name).dump();
     }
     std::string text;
-    for (const auto& element : value) {
-        text += (text.empty() ? "" : " ") + element.dump();
+    for (const base::Json& element : row.list(name)) {
+        text += (text.empty() ? "" : " ") + base::shownValue(element);
     }
     return text;
 }
 
-Results parseJson(const std::string& text, const std::string& fileName)
+ResultRow jsonRow(const base::Json& value, const std::string& place)
 {
-    Results results;
-    try {
-        const auto json = nlohmann::json::parse(text);
-        results.version = json.at("version").get<std::string>();
-        results.command = json.at("command").get<std::string>();
-        for (const auto& object : json.at("rows")) {
-            const std::string place = fileName + ": row " + std::to_string(results.rows.size() + 1);
-            ResultRow row;
-            for (const Column& column : columns()) {
-                readField(column, jsonField(object.at(std::string(column.name)), column.kind), row, place);
-            }
-            checkCounts(row, place);
-            results.rows.push_back(row);
-        }
-    } catch (const nlohmann::json::exception& error) {
-        throw Error(fileName + ": is no result file (" + error.what() + ')');
+    const base::JsonMembers members(value, place);
+    ResultRow row;
+    for (const Column& column : columns()) {
+        readField(column, jsonField(members, column), row, place);
     }
-    return results;
+    checkCounts(row, place);
+    return row;
 }
 
-/// File names in a command, and texts of CSV, may hold bytes that are no UTF-8, which JSON cannot: U+FFFD stands for
-/// them.
-std::string jsonString(const std::string& text)
+Results parseJson(const std::string& text, const std::string& fileName)
 {
-    return nlohmann::json(text).dump(-1, ' ', false, nlohmann::json::error_handler_t::replace);
+    const base::Json json = base::parseJson(text, fileName);
+    const base::JsonMembers members(json, fileName);
+    Results results;
+    results.version = members.text("version");
+    if (!results.version.empty() && !isVersion(results.version)) {
+        members.refuse("version", "which is none");
+    }
+    results.command = members.text("command");
+    for (const base::Json& row : members.list("rows")) {
+        results.rows.push_back(jsonRow(row, fileName + ": row " + std::to_string(results.rows.size() + 1)));
+    }
+    return results;
 }
 
 std::string jsonValue(const Column& column, const ResultRow& row)
@@ -148,7 +142,7 @@ std::string jsonValue(const Column& column, const ResultRow& row)
     case Column::Kind::number:
         return text;
     case Column::Kind::text:
-        return jsonString(text);
+        return base::jsonString(text);
     case Column::Kind::list:
         std::replace(text.begin(), text.end(), ' ', ',');
         return '[' + text + ']';
@@ -184,14 +178,14 @@ std::string csvText(const Results& results)
 
 std::string jsonText(const Results& results)
 {
-    std::string text = "{\n  \"version\": " + jsonString(results.version) +
-                       ",\n  \"command\": " + jsonString(results.command) + ",\n  \"rows\": [";
+    std::string text = "{\n  \"version\": " + base::jsonString(results.version) +
+                       ",\n  \"command\": " + base::jsonString(results.command) + ",\n  \"rows\": [";
     const char* separator = "\n";
     for (const ResultRow& row : results.rows) {
         std::string object;
         for (const Column& column : columns()) {
-            object +=
-                (object.empty() ? "" : ", ") + jsonString(std::string(column.name)) + ": " + jsonValue(column, row);
+            object += (object.empty() ? "" : ", ") + base::jsonString(std::string(column.name)) + ": " +
+                      jsonValue(column, row);
         }
         text += separator + ("    {" + object + '}');
         separator = ",\n";

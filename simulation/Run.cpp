@@ -160,11 +160,8 @@ bool run(const Plan& plan, const RunParts& parts)
     for (const PointResult& point : journal.ended()) {
         parts.progress.hasEnded(point);
     }
-    const std::size_t next = journal.ended().empty() ? 0 : journal.ended().back().number + 1;
-    for (std::size_t point = next; point < plan.points.size(); ++point) {
-        if (isCurveEnded(plan, point, journal.ended())) {
-            continue;
-        }
+    for (std::size_t point = nextPoint(plan, journal.ended()); point < plan.points.size();
+         point = nextPoint(plan, journal.ended())) {
         PointRun pointRun(plan, parts, saving, journal.resultSoFar(point));
         if (!pointRun.go()) {
             journal.save(pointRun.result());

@@ -1,11 +1,10 @@
 // Manifest: manifest.json, which tells all about a set of vectors.
 #include "Manifest.h"
 
-#include <nlohmann/json.hpp>
-
+#include "base/Json.h"
+#include "base/Shown.h"
 #include "simulation/Error.h"
 #include "simulation/Point.h"
-#include "simulation/Shown.h"
 #include "simulation/Thousandths.h"
 
 namespace morvik::vectors {
@@ -55,120 +54,99 @@ Json formatOf(const ManifestFormat& format)
     return {{"name", format.name}, {"files", files}, {"tables", tables}};
 }
 
-/// An integer that has to lie within bounds.
-template <class Integer>
-Integer bounded(const Json& json, const char* name, Integer lowest, Integer highest)
+/// The value of a member that is no larger than 32 bits hold.
+std::uint32_t word(const base::JsonMembers& members, const char* name)
 {
-    const Json& member = json.at(name);
-    const auto value = member.is_number_integer() ? member.get<std::int64_t>() : -1;
-    if (value < static_cast<std::int64_t>(lowest) || value > static_cast<std::int64_t>(highest)) {
-        throw simulation::Error(std::string(name) + ' ' + member.dump() + " is not allowed");
-    }
-    return static_cast<Integer>(value);
+    return static_cast<std::uint32_t>(members.integer(name, 0, UINT32_MAX));
 }
 
-/// The value of a member that is no larger than 32 bits hold.
-std::uint32_t word(const Json& json, const char* name)
+std::vector<unsigned> blockSizesFrom(const base::JsonMembers& json)
 {
-    return bounded(json, name, std::uint32_t{0}, UINT32_MAX);
+    std::vector<unsigned> sizes;
+    for (const base::Json& size : json.list("block_sizes")) {
+        if (!size.is_number_unsigned() || size.get<std::uint64_t>() > UINT32_MAX) {
+            json.refuse("block_sizes", "allowed are lists of numbers of bits");
+        }
+        sizes.push_back(size.get<unsigned>());
+    }
+    return sizes;
 }
 
 /// What the check of a set needs to know. Whatever the core refuses is left to it.
-Settings settingsOf(const Json& json)
+Settings settingsOf(const base::JsonMembers& json)
 {
     Settings settings;
-    settings.generics.C_NUM_PU = bounded(json, "num_pu", 2, 8);
-    const auto name = json.at("algorithm").get<std::string>();
-    const auto algorithm = simulation::algorithmOf(name);
+    settings.generics.C_NUM_PU = static_cast<std::int32_t>(json.integer("num_pu", 2, 8));
+    const auto algorithm = simulation::algorithmOf(json.text("algorithm"));
     if (!algorithm) {
-        throw simulation::Error("algorithm " + simulation::shown(name) + " is not allowed");
+        json.refuse("algorithm", "allowed are max-log, scaled, table");
     }
     settings.generics.C_ALGORITHM_TYPE = static_cast<std::int32_t>(*algorithm);
-    settings.generics.C_TAG_WIDTH = bounded(json, "tag_width", 0, 32);
-    settings.iterations = bounded(json, "iterations", 1U, 15U);
-    settings.width = bounded(json, "width", 8U, 16U);
+    settings.generics.C_TAG_WIDTH = static_cast<std::int32_t>(json.integer("tag_width", 0, 32));
+    settings.iterations = static_cast<unsigned>(json.integer("iterations", 1, 15));
+    settings.width = static_cast<unsigned>(json.integer("width", 8, 16));
     if (settings.width % 8 != 0) {
-        throw simulation::Error("width " + std::to_string(settings.width) + " is not allowed");
+        json.refuse("width", "allowed are 8 and 16");
     }
-    settings.blockSizes = json.at("block_sizes").get<std::vector<unsigned>>();
+    settings.blockSizes = blockSizesFrom(json);
     settings.blocks = word(json, "blocks");
-    settings.directed = json.at("directed").get<bool>();
-    settings.separateStreams = json.at("separate_streams").get<bool>();
-    settings.ratios = json.at("soft").get<bool>();
-    settings.internal = json.at("internal").get<bool>();
+    settings.directed = json.flag("directed");
+    settings.separateStreams = json.flag("separate_streams");
+    settings.ratios = json.flag("soft");
+    settings.internal = json.flag("internal");
     return settings;
 }
 
 /// The tables of a format, which have to be those that it writes, but for their rows.
-std::vector<KeptTable> tablesFrom(const Json& json, const std::string& format, const std::vector<Table>& tables)
+std::vector<KeptTable> tablesFrom(const base::Json& list, const std::string& place, const std::vector<Table>& tables)
 {
     std::vector<KeptTable> found;
     for (const Table& table : tables) {
         const std::size_t i = found.size();
-        const std::uint64_t rows = i < json.size() ? json.at(i).at("rows").get<std::uint64_t>() : 0;
+        const bool isThere = i < list.size();
+        const std::uint64_t rows =
+            isThere ? base::JsonMembers(list[i], place + ": table").integer("rows", 0, UINT64_MAX) : 0;
         found.push_back({table, rows});
-        if (i >= json.size() || nlohmann::json(json.at(i)) != nlohmann::json(tableOf(found.back()))) {
-            throw simulation::Error("format " + format + " lacks the table " + table.name +
-                                    " as its parameters make it");
+        if (!isThere || list[i] != base::Json(tableOf(found.back()))) {
+            throw simulation::Error(place + " lacks the table " + table.name + " as its parameters make it");
         }
     }
-    if (json.size() > found.size()) {
-        throw simulation::Error("format " + format + " has more tables than its parameters make");
+    if (list.size() > found.size()) {
+        throw simulation::Error(place + " has more tables than its parameters make");
     }
     return found;
 }
 
 /// The format with its files, which have to be those that it writes with these settings.
-ManifestFormat formatFrom(const Json& json, const Settings& settings)
+ManifestFormat formatFrom(const base::Json& value, const Settings& settings, const std::string& fileName)
 {
+    const base::JsonMembers json(value, fileName + ": format");
     ManifestFormat found;
-    found.name = json.at("name").get<std::string>();
+    found.name = json.text("name");
     const Format* const format = findFormat(found.name);
     if (format == nullptr) {
-        throw simulation::Error("format " + simulation::shown(found.name) + " is not known");
+        throw simulation::Error(fileName + ": format " + base::shown(found.name) + " is not known");
     }
-    for (const Json& file : json.at("files")) {
-        found.files.push_back({file.at("name").get<std::string>(), file.at("sha256").get<std::string>()});
+    const std::string place = fileName + ": format " + found.name;
+    for (const base::Json& each : json.list("files")) {
+        const base::JsonMembers file(each, fileName + ": file of format " + found.name);
+        found.files.push_back({file.text("name"), file.text("sha256")});
     }
     std::size_t next = 0;
     const std::vector<Table> tables = Layout(*format, settings).tables;
     for (const Table& table : tables) {
         for (const std::string& name : format->files(table)) {
             if (next == found.files.size() || found.files[next].name != name) {
-                throw simulation::Error("format " + found.name + " lacks the file " + name);
+                throw simulation::Error(place + " lacks the file " + name);
             }
             ++next;
         }
     }
     if (next < found.files.size()) {
-        throw simulation::Error("format " + found.name + " has no file " + simulation::shown(found.files[next].name));
+        throw simulation::Error(place + " has no file " + base::shown(found.files[next].name));
     }
-    found.tables = tablesFrom(json.at("tables"), found.name, tables);
+    found.tables = tablesFrom(json.list("tables"), place, tables);
     return found;
-}
-
-Manifest manifestFrom(const Json& json)
-{
-    Manifest manifest;
-    manifest.version = json.at("version").get<std::string>();
-    manifest.command = json.at("command").get<std::string>();
-    manifest.settings = settingsOf(json.at("parameters"));
-    for (const Json& format : json.at("formats")) {
-        manifest.formats.push_back(formatFrom(format, manifest.settings));
-    }
-    for (const Json& block : json.at("blocks")) {
-        manifest.blocks.push_back({block.at("name").get<std::string>(),
-                                   word(block, "block_size"),
-                                   word(block, "tag"),
-                                   word(block, "expected_tag")});
-    }
-    if (manifest.formats.empty()) {
-        throw simulation::Error("names no format");
-    }
-    if (manifest.blocks.empty()) {
-        throw simulation::Error("names no block");
-    }
-    return manifest;
 }
 
 }  // namespace
@@ -189,18 +167,32 @@ std::string manifestText(const Manifest& manifest)
         json["formats"].push_back(formatOf(format));
     }
     constexpr int indentation = 2;
-    return json.dump(indentation) + '\n';
+    return json.dump(indentation, ' ', false, Json::error_handler_t::replace) + '\n';
 }
 
 Manifest parseManifest(const std::string& text, const std::string& fileName)
 {
-    try {
-        return manifestFrom(Json::parse(text));
-    } catch (const nlohmann::json::exception& error) {
-        throw simulation::Error(fileName + ": is no manifest of vectors (" + error.what() + ')');
-    } catch (const simulation::Error& error) {
-        throw simulation::Error(fileName + ": " + error.what());
+    const base::Json json = base::parseJson(text, fileName);
+    const base::JsonMembers members(json, fileName);
+    Manifest manifest;
+    manifest.version = members.text("version");
+    manifest.command = members.text("command");
+    manifest.settings = settingsOf({members.at("parameters"), fileName + ": parameters"});
+    for (const base::Json& format : members.list("formats")) {
+        manifest.formats.push_back(formatFrom(format, manifest.settings, fileName));
     }
+    for (const base::Json& each : members.list("blocks")) {
+        const base::JsonMembers block(each, fileName + ": block " + std::to_string(manifest.blocks.size()));
+        manifest.blocks.push_back(
+            {block.text("name"), word(block, "block_size"), word(block, "tag"), word(block, "expected_tag")});
+    }
+    if (manifest.formats.empty()) {
+        throw simulation::Error(fileName + ": names no format");
+    }
+    if (manifest.blocks.empty()) {
+        throw simulation::Error(fileName + ": names no block");
+    }
+    return manifest;
 }
 
 }  // namespace morvik::vectors

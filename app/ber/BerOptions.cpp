@@ -27,6 +27,7 @@ constexpr std::uint64_t defaultBlockErrors = 100;
 constexpr std::uint64_t defaultMaxBlocks = 1000000;
 constexpr double defaultStopBler = 1e-4;
 constexpr int largestMilliScale = 1000000;
+constexpr std::uint64_t mostPoints = 1000000;
 
 // ---- Elements of the lists
 
@@ -283,7 +284,10 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
         ->type_name("T")
         ->default_str("3");
     CLI::Option* const resume =
-        command.add_flag("--resume", options.resume, "Go on where the run with the same parameters was stopped")
+        command
+            .add_flag("--resume",
+                      options.resume,
+                      "Go on where the run was stopped or, with larger limits than it had, where it ended")
             ->needs(output);
     command.add_flag("--overwrite", options.overwrite, "Replace earlier results, finished or not")
         ->needs(output)
@@ -403,6 +407,11 @@ simulation::Plan planOf(const BerOptions& options)
 {
     if (options.eachIteration && options.sweep.iterations.size() > 1) {
         throw simulation::Error("--each-iteration counts up to one number of --iterations, give only the largest");
+    }
+    const std::uint64_t points = simulation::countOfPoints(options.sweep);
+    if (points > mostPoints) {
+        throw simulation::Error("the lists combine to " + std::to_string(points) + " points, a run has " +
+                                std::to_string(mostPoints) + " at most");
     }
     simulation::Plan plan;
     plan.points = simulation::pointsOf(options.sweep);

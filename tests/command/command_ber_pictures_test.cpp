@@ -85,7 +85,7 @@ TEST_F(BerPictures, TakeResultsOfEitherFormatAsReferences)
     morvik.write("bad.json", "{}");
     const CommandResult bad = morvik.run(Arguments{"ber"} + twoCurves + words("--plot c.svg --reference bad.json"));
     EXPECT_EQ(bad.status, 2);
-    EXPECT_EQ(bad.err.find("morvik ber: bad.json: is no result file ("), 0U) << bad.err;
+    EXPECT_EQ(bad.err, "morvik ber: bad.json: lacks \"version\"\n");
 }
 
 TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)

@@ -262,7 +262,8 @@ TEST_F(BerRuns, ResumeNoOtherRun)
           std::pair("--block-errors 100000", "without --block-errors"),
           std::pair("--each-iteration", "without --each-iteration")}) {
         expectRefused(again + words(other) + Arguments{"--resume"},
-                      place + "holds a run with other parameters: " + difference);
+                      place + "holds a run with other parameters: " + difference +
+                          "; nothing but limits may change, which may grow; --overwrite starts anew");
     }
     EXPECT_EQ(checkpoint(), kept);
 
@@ -284,6 +285,22 @@ TEST_F(BerRuns, FindOutThatTheirOutputCannotBeWrittenBeforeTheyStart)
     expectRefused(run + Arguments{"-"},
                   "morvik ber: -: is no name for results, allowed are names that end in .csv or .json");
     EXPECT_EQ(morvik.names(), Arguments{});
+}
+
+TEST_F(BerRuns, OfTooManyPointsAreRefusedAtOnce)
+{
+    expectRefused(words("ber --block-size 40 --ebn0 -50:0.001:50 --scale 1,2,3,4,5,6,7,8,9,10"),
+                  "morvik ber: the lists combine to 1000010 points, a run has 1000000 at most");
+}
+
+TEST_F(BerRuns, TakeNoCheckpointOnTrust)
+{
+    const Arguments run = words("ber --quiet --block-size 40 --ebn0 0 --max-blocks 10 --output a.csv --resume");
+    morvik.write("a.csv.checkpoint", "morvik checkpoint f0066aa2fa6346c5\n" + std::string(100000, '['));
+    expectRefused(run, "morvik ber: a.csv.checkpoint:2: character 33 opens more than 32 levels of lists and objects");
+    morvik.write("a.json", std::string(100000, '['));
+    expectRefused({"merge", "a.json"},
+                  "morvik merge: a.json:1: character 33 opens more than 32 levels of lists and objects");
 }
 
 TEST_F(BerRuns, ResumeACompleteRunWithoutSimulatingAnything)
@@ -315,6 +332,83 @@ TEST_F(BerRuns, ReplaceResultsOnlyWhenTheyAreAskedTo)
     const CommandResult both = morvik.run(run + Arguments{"2", "--overwrite", "--resume"});
     EXPECT_EQ(both.status, 2);
     EXPECT_EQ(both.err, "morvik ber: --resume excludes --overwrite; 'morvik ber --help' tells what is allowed\n");
+}
+
+// ---- Runs that are extended
+
+/// Points of two curves, which end for all kinds of reasons; the larger limits end the curves elsewhere.
+const Arguments curves = words("--block-size 40,104 --ebn0 0:0.5:4 --iterations 3 --stop-bler 0.01");
+const Arguments smallLimits = words("--max-blocks 300 --block-errors 30 --bit-errors 150");
+const Arguments largeLimits = words("--max-blocks 4000 --block-errors 60 --bit-errors 700");
+
+TEST_F(BerRuns, GrowWithTheirLimitsToWhatOneRunGives)
+{
+    for (const Arguments& iterations : {Arguments{}, Arguments{"--each-iteration"}}) {
+        const Arguments run = curves + iterations;
+        for (const std::string file : {"results.csv", "results.json"}) {
+            const std::string whole = berFile(run + largeLimits, "whole" + file.substr(7));
+            for (const Arguments& threads : {words("--threads 1"), words("--threads 2")}) {
+                EXPECT_NE(berFile(run + smallLimits + threads, file), whole);
+                ber(run + largeLimits + threads + Arguments{"--quiet", "--resume", "--output", file});
+                EXPECT_EQ(withoutTimes(morvik.read(file)), whole);
+            }
+        }
+    }
+}
+
+TEST_F(BerRuns, GrowFromACheckpointToo)
+{
+    const Arguments points = words("--block-size 40,104 --ebn0 0:0.2:3.6 --iterations 4");
+    const Arguments larger = points + words("--max-blocks 40000 --block-errors 900");
+    const std::string whole = berFile(larger, "whole.csv");
+    for (const Arguments& threads : {words("--threads 1"), words("--threads 2")}) {
+        Process process = start(points + words("--max-blocks 30000 --block-errors 700 --overwrite"));
+        ASSERT_TRUE(waitForCheckpoint("\"number\": 5,"));
+        process.send(SIGTERM);
+        process.wait();
+        EXPECT_EQ(berFile(larger + threads + Arguments{"--resume"}), whole);
+        EXPECT_EQ(morvik.names(), (Arguments{"messages", "results.csv", "whole.csv"}));
+    }
+}
+
+TEST_F(BerRuns, DoNotGoOnWithSmallerLimits)
+{
+    const Arguments points = words("ber --quiet --block-size 40 --ebn0 0,1 --seed 3");
+    const auto resumed = [&](const std::string& file, const std::string& limits) {
+        return points + words(limits) + Arguments{"--resume", "--output", file};
+    };
+    for (const std::string file : {"a.csv", "a.json"}) {
+        EXPECT_EQ(morvik.run(points + words("--max-blocks 60 --block-errors 1000 --output") + Arguments{file}).status,
+                  0);
+    }
+    const std::string beyond =
+        "holds more of point 0 than the limits of this run allow; they may be larger than before, --overwrite starts "
+        "anew";
+    const std::string other = ", and there is no checkpoint to resume; --overwrite starts anew";
+    expectRefused(resumed("a.csv", "--max-blocks 59 --block-errors 1000"), "morvik ber: a.csv: " + beyond);
+    expectRefused(resumed("a.json", "--max-blocks 59 --block-errors 1000"),
+                  "morvik ber: a.json: holds other results (--max-blocks 60 instead of 59)" + other);
+    // The last block error came before the last frame, which the counts alone do not tell.
+    const std::vector<CsvRow> rows = csvRows(morvik.read("a.csv"));
+    const CommandResult exact = morvik.run({"ber",
+                                            "--block-size",
+                                            "40",
+                                            "--ebn0",
+                                            "0",
+                                            "--seed",
+                                            "3",
+                                            "--block-errors",
+                                            rows[0].at("block_errors"),
+                                            "--quiet",
+                                            "--output",
+                                            "b.csv"});
+    EXPECT_EQ(exact.status, 0) << exact.err;
+    ASSERT_NE(csvRows(morvik.read("b.csv"))[0].at("blocks"), "60") << "another seed is needed";
+    expectRefused(resumed("a.csv", "--max-blocks 60 --block-errors " + rows[0].at("block_errors")),
+                  "morvik ber: a.csv: " + beyond);
+    expectRefused(resumed("a.json", "--max-blocks 60 --block-errors 999"),
+                  "morvik ber: a.json: holds other results (--block-errors 1000 instead of 999)" + other);
+    EXPECT_EQ(morvik.names(), (Arguments{"a.csv", "a.json", "b.csv"}));
 }
 
 // ---- Runs in parts

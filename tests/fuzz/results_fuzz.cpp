@@ -37,6 +37,6 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
     const std::string text(reinterpret_cast<const char*>(data), size);
     readResults(text, "in.csv");
     readResults(text, "in.json");
-    require(!simulation::parseCheckpoint(text), "a checksum of 64 bits is not met by chance");
+    require(!simulation::parseCheckpoint(text, "in.checkpoint"), "a checksum of 64 bits is not met by chance");
     return 0;
 }

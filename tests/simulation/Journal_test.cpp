@@ -28,6 +28,12 @@ protected:
         return {number, support::countOneByOne(support::SyntheticFrames(1), {0, blocks}, StopRules(), 1), 1};
     }
 
+    /// The same number of frames, behind those.
+    static PointResult later(std::size_t number)
+    {
+        return {number, support::countOneByOne(support::SyntheticFrames(1), {20, 40}, StopRules(), 1), 1};
+    }
+
     /// Why the journal cannot be opened.
     std::string refusal(Earlier earlier) const
     {
@@ -88,6 +94,7 @@ TEST_F(JournalFiles, AreNotNeeded)
 TEST_F(JournalFiles, TellHowFarARunHasCome)
 {
     {
+        plan.rules.maxBlocks = 20;
         Journal journal(plan, output, Earlier::refuse);
         journal.end(resultOf(0, 20));
         journal.save(resultOf(1, 7));
@@ -139,20 +146,50 @@ TEST_F(JournalFiles, KeepOtherResultsFromAnAttemptToResume)
     const std::vector<PointResult> points = {resultOf(0, 20), resultOf(1, 20)};
     writeResults(output, resultsOf(plan, {points[0]}));
     expectRefused();  // a part of it
-    writeResults(output, resultsOf(plan, {points[0], resultOf(1, 19)}));
-    expectRefused();
     Plan other = plan;
     other.seed = 2;
     writeResults(output, resultsOf(other, points));
     expectRefused();
     other = plan;
     other.frames.from = 20;
-    writeResults(output, resultsOf(other, points));
+    writeResults(output, resultsOf(other, {later(0), later(1)}));
     expectRefused();
     other = plan;
     other.points = pointsOf({{40}, {4}, {1}, {std::nullopt}, {8}, {0, 500, 1000}});
     writeResults(output, resultsOf(other, {points[0], points[1], resultOf(2, 20)}));
     expectRefused();
+}
+
+TEST_F(JournalFiles, OfACompleteRunWithSmallerLimitsAreGoneOnWith)
+{
+    plan.command = "morvik ber --max-blocks 20";
+    plan.rules.maxBlocks = 20;
+    for (const char* const name : {"results.csv", "results.json"}) {
+        const std::string file = folder.path(name);
+        writeResults(file, resultsOf(plan, {resultOf(0, 20), resultOf(1, 20)}));
+        const std::string results = folder.read(name);
+        Plan larger = plan;
+        larger.command = "morvik ber --max-blocks 30";
+        larger.rules.maxBlocks = 30;
+        {
+            Journal journal(larger, file, Earlier::resume);
+            EXPECT_TRUE(journal.ended().empty());
+            support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 20).tally);
+            journal.begin();
+            EXPECT_EQ(folder.read(name), results) << "until a point has ended";
+            journal.end(resultOf(0, 30));
+            journal.save(std::nullopt);
+        }
+        Journal journal(larger, file, Earlier::resume);
+        ASSERT_EQ(journal.ended().size(), 1U);
+        support::expectEqual(journal.ended()[0].tally, resultOf(0, 30).tally);
+        support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 20).tally);
+        journal.end(resultOf(1, 30));
+        journal.complete();
+        const auto points = {resultOf(0, 30), resultOf(1, 30)};
+        EXPECT_EQ(csvText(readResults(file)), csvText(resultsOf(larger, points)));
+        EXPECT_EQ(readResults(file).command, file == output ? "" : larger.command);
+    }
 }
 
 TEST_F(JournalFiles, AreNotLostToAnotherRun)
@@ -173,11 +210,14 @@ TEST_F(JournalFiles, OfOtherParametersAreRefused)
         Journal journal(plan, output, Earlier::refuse);
         journal.begin();
     }
+    const std::string remedy = "; nothing but limits may change, which may grow; --overwrite starts anew";
     plan.command = "morvik ber --seed 2";
-    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run with other parameters: --seed 1 instead of 2");
+    EXPECT_EQ(refusal(Earlier::resume),
+              checkpoint + ": holds a run with other parameters: --seed 1 instead of 2" + remedy);
     plan.command = "morvik ber --seed 1";
     plan.version = "1.2.4";
-    EXPECT_EQ(refusal(Earlier::resume), checkpoint + ": holds a run of version 1.2.3, this is 1.2.4");
+    EXPECT_EQ(refusal(Earlier::resume),
+              checkpoint + ": holds a run of version \"1.2.3\", this is 1.2.4; --overwrite starts anew");
 }
 
 TEST_F(JournalFiles, ThatAreDamagedAreRefused)

@@ -166,13 +166,38 @@ TEST(Plan, MakesRowsAfterEachIterationInTheOrderOfASweepOverThem)
     }
 }
 
-TEST(Plan, NamesTheOptionsThatDiffer)
+TEST(Plan, TellsWhatKeepsARunFromGoingOn)
 {
-    EXPECT_EQ(differenceOf("morvik ber --seed 1 --num-pu 4", "morvik ber --seed 1 --num-pu 4"), "");
-    EXPECT_EQ(differenceOf("morvik ber --ebn0 -1:0.5:2 --seed 1", "morvik ber --ebn0 -1 --seed 1"),
+    EXPECT_EQ(obstaclesBetween("morvik ber --seed 1 --num-pu 4", "morvik ber --seed 1 --num-pu 4"), "");
+    EXPECT_EQ(obstaclesBetween("morvik ber --ebn0 -1:0.5:2 --seed 1", "morvik ber --ebn0 -1 --seed 1"),
               "--ebn0 -1:0.5:2 instead of -1");
-    EXPECT_EQ(differenceOf("morvik ber --each-iteration --seed 1", "morvik ber --seed 2 --frames 0:5"),
+    EXPECT_EQ(obstaclesBetween("morvik ber --each-iteration --seed 1", "morvik ber --seed 2 --frames 0:5"),
               "--each-iteration, --seed 1 instead of 2, without --frames");
+    const std::string hostile = obstaclesBetween("morvik ber --\x1b[31m" + std::string(100000, 'x'), "morvik ber");
+    EXPECT_EQ(hostile.substr(0, 8), "--?[31mx");
+    EXPECT_LT(hostile.size(), 100U);
+}
+
+TEST(Plan, LetsLimitsGrow)
+{
+    const auto obstacle = [](const std::string& before, const std::string& now) {
+        return obstaclesBetween("morvik ber " + before, "morvik ber " + now);
+    };
+    for (const char* const option : {"--block-errors ", "--bit-errors ", "--max-blocks ", "--max-time "}) {
+        const std::string limit = option;
+        EXPECT_EQ(obstacle(limit + "9", limit + "10"), "");
+        EXPECT_EQ(obstacle(limit + "9", ""), "");
+        EXPECT_EQ(obstacle(limit + "10", limit + "9"), limit + "10 instead of 9");
+        EXPECT_NE(obstacle("", limit + "10"), "");
+        EXPECT_NE(obstacle(limit + "x", limit + "10"), "");
+    }
+    EXPECT_EQ(obstacle("--max-time 1.5", "--max-time 1e3"), "");
+    EXPECT_EQ(obstacle("--frames 5:10", "--frames 5:11"), "");
+    EXPECT_EQ(obstacle("--frames 5:10", "--frames 4:11"), "--frames 5:10 instead of 4:11");
+    EXPECT_EQ(obstacle("--frames 5:10", "--frames 5:9"), "--frames 5:10 instead of 5:9");
+    EXPECT_EQ(obstacle("--frames 0:10", ""), "");
+    EXPECT_EQ(obstacle("--frames 5:10", ""), "--frames 5:10");
+    EXPECT_EQ(obstacle("--stop-bler 0", "--stop-bler 1"), "--stop-bler 0 instead of 1");
 }
 
 }  // namespace

@@ -154,18 +154,36 @@ TEST_F(ResultFiles, AreShownInPrintableTextWhereTheyAreWrong)
 
 TEST_F(ResultFiles, WithImpossibleCountsAreRefused)
 {
-    const std::string cannotBe = "a.csv:2: numbers of errors that cannot be";
-    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,41,196,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",3,4,196,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",1601,4,1601,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,27,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,3,196,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,1160,")), cannotBe)
+    const auto cannotBe = [](const std::string& what) {
+        return "a.csv:2: " + what;
+    };
+    const std::string ofFour = ", of 4 wrong blocks of 40 bits";
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,41,196,")),
+              cannotBe("block_errors 41 cannot be, of 40 blocks"));
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",3,4,196,")), cannotBe("bit_errors 3 cannot be" + ofFour));
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",161,4,1601,")), cannotBe("bit_errors 161 cannot be" + ofFour));
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,27,")),
+              cannotBe("bit_error_squares 27 cannot be, of 28 wrong bits"));
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,3,196,")),
+              cannotBe("failed_frames cannot be the first of 3 wrong blocks of 40 bits in these frames"));
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,1160,")),
+              cannotBe("bit_error_squares 1160 cannot be, of 28 wrong bits"))
         << "more than all bits of as few blocks";
-    EXPECT_EQ(refusal("a.csv", csvWith(",120,2.27", ",5281,2.27")), cannotBe) << "40 blocks have 5280 soft values";
-    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",0:18446744073709551615,18446744073709551615,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",5:281474976710662,281474976710657,")), cannotBe);
-    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",5:281474976710661,281474976710656,")), "none");
+    EXPECT_EQ(refusal("a.csv", csvWith(",120,2.27", ",5281,2.27")),
+              cannotBe("clipped_values 5281 cannot be, of 40 blocks of 40 bits"))
+        << "40 blocks have 5280 soft values";
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",0:18446744073709551615,18446744073709551615,")),
+              cannotBe("blocks 18446744073709551615 cannot be, of 281474976710656 at most"));
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",0:281474976710657,281474976710657,")),
+              cannotBe("blocks 281474976710657 cannot be, of 281474976710656 at most"));
+    EXPECT_EQ(refusal("a.csv", csvWith(",0:40,40,", ",0:281474976710656,281474976710656,")), "none");
+    const std::string failures = cannotBe("failed_frames cannot be the first" + ofFour.substr(1) + " in these frames");
+    for (const char* const frames : {",0 10 20 40,", ",0 10 20,", ",0 10 10 20,", ",10 0 20 30,"}) {
+        EXPECT_EQ(refusal("a.csv", csvWith(",0 10 20 30,", frames)), failures) << frames;
+    }
+    for (const char* const seconds : {",-1,", ",nan,", ",inf,", ",1e300,"}) {
+        EXPECT_NE(refusal("a.csv", csvWith(",0.125,", seconds)), "none") << seconds;
+    }
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,28,")), "none");
 }
 
@@ -197,14 +215,33 @@ TEST_F(ResultFiles, OfBrokenJsonAreRefused)
 {
     const std::string whole = jsonText(exampleResults());
     for (const std::string& text : {std::string(), std::string("[]"), std::string("{}"), whole.substr(0, 300)}) {
-        EXPECT_EQ(refusal("a.json", text).substr(0, 27), "a.json: is no result file (");
+        EXPECT_NE(refusal("a.json", text), "none");
     }
+    EXPECT_EQ(refusal("a.json", "[]"), "a.json: is a list, expected an object");
+    EXPECT_EQ(refusal("a.json", "{}"), "a.json: lacks \"version\"");
+    EXPECT_EQ(refusal("a.json", whole.substr(0, 40)), "a.json:3: no JSON, character 17 is not expected there");
+    EXPECT_EQ(refusal("a.json", std::string(100000, '[')),
+              "a.json:1: character 33 opens more than 32 levels of lists and objects");
     std::string wrong = whole;
     wrong.replace(wrong.find("\"ebn0_db\": 1.25"), 15, "\"ebn0_db\": \"1\"");
-    EXPECT_EQ(refusal("a.json", wrong), "a.json: row 1: ebn0_db \"\" is not allowed");
+    EXPECT_EQ(refusal("a.json", wrong), "a.json: row 1: \"ebn0_db\" is \"1\", expected a number");
     wrong = whole;
     wrong.replace(wrong.find("\"bit_errors\""), 12, "\"bat_errors\"");
-    EXPECT_EQ(refusal("a.json", wrong).substr(0, 27), "a.json: is no result file (");
+    EXPECT_EQ(refusal("a.json", wrong), "a.json: row 1: lacks \"bit_errors\"");
+}
+
+TEST_F(ResultFiles, OfJsonBringNoLinesIntoCsv)
+{
+    const std::string whole = jsonText(exampleResults());
+    for (const char* const version : {"1\\n2", "1,2", "1 2", "1\\r", ""}) {
+        std::string wrong = whole;
+        const std::size_t place = wrong.rfind("1.2.3");
+        wrong.replace(place, 5, version);
+        EXPECT_EQ(refusal("a.json", wrong).substr(0, 23), "a.json: row 2: version ") << version;
+        wrong = whole;
+        wrong.replace(wrong.find("1.2.3"), 5, version);
+        EXPECT_EQ(refusal("a.json", wrong).substr(0, 17), *version == '\0' ? "none" : "a.json: \"version\"") << version;
+    }
 }
 
 }  // namespace

@@ -252,6 +252,37 @@ TEST(Run, InterruptedAnywhereEndsInTheSameResults)
     EXPECT_EQ(folder.names(), std::vector<std::string>{"results.csv"});
 }
 
+TEST(Run, ExtendedAnywhereEndsInTheSameResults)
+{
+    int extended = 0;
+    for (unsigned seed = 1; seed <= 8; ++seed) {
+        Plan plan = planOf({2}, {0, 1, 2, 3, 4});
+        plan.eachIteration = seed % 2 == 0;
+        plan.rules.stopBler = 0.13;  // where about half of the points are
+        const support::TemporaryFolder folder;
+        std::mt19937 random(seed);
+        auto earlier = Journal::Earlier::refuse;
+        for (const unsigned limit : {20U, 50U, 120U, 300U}) {
+            plan.rules.maxBlocks = 10 * limit;
+            plan.rules.blockErrors = limit;
+            plan.command =
+                "morvik ber --block-errors " + std::to_string(limit) + " --max-blocks " + std::to_string(10 * limit);
+            ShufflingWorkers workers(plan, static_cast<unsigned>(1 + random() % 4), seed);
+            NotedProgress progress;
+            Journal journal(plan, folder.path("results.json"), earlier);
+            earlier = Journal::Earlier::resume;
+            int steps = limit == 300 ? 1000000 : static_cast<int>(random() % 6);
+            const bool isComplete = run(plan, {workers, journal, progress, [&steps] { return steps-- == 0; }, 1e9});
+            if (isComplete) {
+                EXPECT_EQ(textOf(plan, journal.ended()), definition(plan));
+                extended += limit == 300 ? 1 : 0;
+                break;  // for the last frame of results is decoded, and these frames cannot be
+            }
+        }
+    }
+    EXPECT_GT(extended, 4);
+}
+
 /// Fails after some batches.
 class FailingWorkers : public ShufflingWorkers {
 public:

@@ -255,6 +255,10 @@ TEST(NameMap, NamesWhatIsWrong)
     expectMapRefused("[]", "map.json: no map, expected a JSON object");
     expectMapRefused("{", "map.json:2: no JSON, character 1 is not expected there");
     expectMapRefused("{\"bits\": 16,\n \"valid\" \"on\"}", "map.json:2: no JSON, character 13 is not expected there");
+    expectMapRefused(R"({"signals": )" + std::string(100000, '[') + '}',
+                     "map.json:1: character 44 opens more than 32 levels of lists and objects");
+    expectMapRefused(R"({"bits": 16, "bits": 17})", "map.json:1: \"bits\" is there twice");
+    expectMapRefused(R"({"bits": [[1]]})", "map.json: \"bits\" is a list, allowed are the integers 8 to 32");
     expectMapRefused(R"({"signal": {}})",
                      "map.json: \"signal\" is no key of a map, allowed are columns, signals, numbers, bits, "
                      "first_half_iteration, first_step, valid");

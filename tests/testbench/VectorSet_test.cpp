@@ -431,22 +431,32 @@ TEST_F(VectorSet, RefusesAManifestThatIsNone)
             ASSERT_NE(read("manifest.json"), good) << match;
             expectRefused(path() + "/manifest.json: " + what);
         };
-    expectManifestRefused("\"iterations\": 2", "\"iterations\": 16", "iterations 16 is not allowed");
-    expectManifestRefused("\"iterations\": 2", "\"iterations\": 2.5", "iterations 2.5 is not allowed");
-    expectManifestRefused("\"iterations\": 2", "\"iterations\": 1e30", "iterations 1e+30 is not allowed");
-    expectManifestRefused("\"tag\": 1", "\"tag\": -1", "tag -1 is not allowed");
+    expectManifestRefused("\"iterations\": 2",
+                          "\"iterations\": 16",
+                          "parameters: \"iterations\" is 16, allowed are the integers 1 to 15");
+    expectManifestRefused("\"iterations\": 2",
+                          "\"iterations\": 2.5",
+                          "parameters: \"iterations\" is 2.5, allowed are the integers 1 to 15");
+    expectManifestRefused("\"iterations\": 2",
+                          "\"iterations\": 1e30",
+                          "parameters: \"iterations\" is 1e+30, allowed are the integers 1 to 15");
+    expectManifestRefused(
+        "\"tag\": 1", "\"tag\": -1", "block 1: \"tag\" is -1, allowed are the integers 0 to 4294967295");
     expectManifestRefused("\"tag\": 1", "\"tag\": 3", "has another size or tag of block 1 than csv");
     expectManifestRefused("\"block_size\": 40", "\"block_size\": 48", "has another size or tag of block 0 than csv");
-    expectManifestRefused("\"width\": 8", "\"width\": 12", "width 12 is not allowed");
-    expectManifestRefused("\"scaled\"", "\"best\"", "algorithm \"best\" is not allowed");
+    expectManifestRefused("\"width\": 8", "\"width\": 12", "parameters: \"width\" is 12, allowed are 8 and 16");
+    expectManifestRefused(
+        "\"scaled\"", "\"best\"", "parameters: \"algorithm\" is \"best\", allowed are max-log, scaled, table");
     expectManifestRefused("\"name\": \"csv\"", "\"name\": \"xls\"", "format \"xls\" is not known");
     expectManifestRefused("ratios.csv", "../ratios.csv", "format csv lacks the file ratios.csv");
     expectManifestRefused("\"soft\": true", "\"soft\": false", "format csv lacks the file internal.csv");
     expectManifestRefused("\"internal\": true", "\"internal\": false", "format csv has no file \"internal.csv\"");
     folder.write("set/manifest.json", "{}");
-    EXPECT_THROW(checkSet(path()), simulation::Error);
+    expectRefused(path() + "/manifest.json: lacks \"version\"");
     folder.write("set/manifest.json", "{");
-    EXPECT_THROW(checkSet(path()), simulation::Error);
+    expectRefused(path() + "/manifest.json:1: no JSON, character 2 is not expected there");
+    folder.write("set/manifest.json", std::string(100000, '['));
+    expectRefused(path() + "/manifest.json:1: character 33 opens more than 32 levels of lists and objects");
     std::filesystem::remove(path() + "/manifest.json");
     expectRefused(path() + "/manifest.json: cannot be opened: No such file or directory");
 }

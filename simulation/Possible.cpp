@@ -1,0 +1,63 @@
+// Possible: whether numbers that were read from a file can have been counted.
+#include "Possible.h"
+
+#include <algorithm>
+#include <functional>
+#include <vector>
+
+namespace simulation {
+
+namespace {
+
+std::string cannotBe(const char* column, std::uint64_t number, const std::string& of)
+{
+    return std::string(column) + ' ' + std::to_string(number) + " cannot be, of " + of;
+}
+
+/// Whether the frames are those that failed first, of so many.
+bool areFailures(const std::vector<std::uint64_t>& failures, const FrameSet& frames, std::uint64_t blockErrors)
+{
+    return failures.size() == std::min<std::uint64_t>(blockErrors, ErrorCounts::keptFailures) &&
+           std::all_of(failures.begin(), failures.end(), [&](std::uint64_t frame) { return frames.has(frame); }) &&
+           std::adjacent_find(failures.begin(), failures.end(), std::greater_equal<>()) == failures.end();
+}
+
+}  // namespace
+
+std::optional<std::string> impossibleCount(const FrameSet& frames,
+                                           unsigned K,
+                                           const ErrorCounts& errors,
+                                           std::uint64_t clipped)
+{
+    const std::uint64_t blocks = frames.size();
+    if (blocks > mostBlocks) {
+        return cannotBe("blocks", blocks, std::to_string(mostBlocks) + " at most");
+    }
+    const std::string wrongBlocks =
+        std::to_string(errors.blockErrors) + " wrong blocks of " + std::to_string(K) + " bits";
+    if (errors.blockErrors > blocks) {
+        return cannotBe("block_errors", errors.blockErrors, std::to_string(blocks) + " blocks");
+    }
+    if (errors.bitErrors < errors.blockErrors || errors.bitErrors > errors.blockErrors * K) {
+        return cannotBe("bit_errors", errors.bitErrors, wrongBlocks);
+    }
+    if (errors.bitErrorSquares < errors.bitErrors || errors.bitErrorSquares / K > errors.bitErrors) {
+        return cannotBe("bit_error_squares", errors.bitErrorSquares, std::to_string(errors.bitErrors) + " wrong bits");
+    }
+    if (clipped > std::uint64_t{3} * (K + 4) * blocks) {
+        return cannotBe(
+            "clipped_values", clipped, std::to_string(blocks) + " blocks of " + std::to_string(K) + " bits");
+    }
+    if (!areFailures(errors.failures, frames, errors.blockErrors)) {
+        return "failed_frames cannot be the first of " + wrongBlocks + " in these frames";
+    }
+    return std::nullopt;
+}
+
+bool isPossibleTime(double seconds)
+{
+    constexpr double longest = 1e12;  // even of several runs together
+    return seconds >= 0 && seconds <= longest;
+}
+
+}  // namespace simulation

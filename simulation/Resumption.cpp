@@ -1,0 +1,222 @@
+// Resumption: what a run can go on with of what an earlier one has counted.
+#include "Resumption.h"
+
+#include <algorithm>
+#include <map>
+#include <optional>
+
+#include "Error.h"
+#include "FrameSimulator.h"
+#include "Possible.h"
+#include "ResultFiles.h"
+#include "base/Json.h"
+
+namespace simulation {
+
+namespace {
+
+// ---- Whether a point has ended, or should have
+
+/// Whether nothing is left to be counted.
+bool hasEnded(const Plan& plan, const PointResult& result)
+{
+    constexpr double rounding = 0.0005;  // of times in result files
+    const Tally& tally = result.tally;
+    const auto& limit = plan.rules.maxSeconds;
+    const bool isTimeUp = limit && tally.blocks > 0 && result.seconds + rounding >= *limit;
+    return isTimeUp || tally.blocks == plan.mostFrames() || isReached(plan.rules, tally.blocks, tally.errors.back());
+}
+
+/// Whether more has been counted than the plan would have.
+bool isBeyond(const Plan& plan, const PointResult& result)
+{
+    const StopRules& rules = plan.rules;
+    const ErrorCounts& errors = result.tally.errors.back();
+    const std::uint64_t bitsOfLast = plan.points[result.number].blockSize;
+    return result.tally.blocks > plan.mostFrames() || (rules.blockErrors && errors.blockErrors > *rules.blockErrors) ||
+           (rules.bitErrors && errors.bitErrors >= *rules.bitErrors &&
+            errors.bitErrors - *rules.bitErrors >= bitsOfLast);
+}
+
+/// Whether a limit of errors was met before the last frame.
+bool wasMetBefore(const Plan& plan, const PointResult& result, FrameSimulator& simulator)
+{
+    ErrorCounts errors = result.tally.errors.back();
+    StopRules rules = plan.rules;
+    rules.maxBlocks.reset();
+    const std::uint64_t blocks = result.tally.blocks;
+    if (blocks == 0 || !isReached(rules, blocks, errors)) {
+        return false;
+    }
+    BatchResult last = simulator.begin({result.number, plan.frames.from + blocks - 1, 1});
+    simulator.proceed(last);
+    const std::uint32_t wrongBits = last.wrongBits.back();
+    const std::uint64_t wrongBlocks = wrongBits > 0 ? 1 : 0;
+    if (errors.bitErrors < wrongBits || errors.blockErrors < wrongBlocks) {
+        return true;  // the row is not of these frames
+    }
+    errors.bitErrors -= wrongBits;
+    errors.blockErrors -= wrongBlocks;
+    return isReached(rules, blocks - 1, errors);
+}
+
+[[noreturn]] void refuseBeyond(const PointResult& result, const std::string& fileName)
+{
+    throw Error(fileName + ": holds more of point " + std::to_string(result.number) +
+                " than the limits of this run allow; they may be larger than before, --overwrite starts anew");
+}
+
+// ---- What is taken on no trust
+
+/// Throws Error unless the plan has the point, and its counts can be.
+void checkPoint(const Plan& plan, const PointResult& result, const std::string& fileName)
+{
+    const std::string place = fileName + ": point " + std::to_string(result.number);
+    if (result.number >= plan.points.size()) {
+        throw Error(place + ": is none of this run");
+    }
+    const Point& point = plan.points[result.number];
+    const Tally& tally = result.tally;
+    if (tally.errors.size() != plan.countsOf(point)) {
+        throw Error(place + ": has " + std::to_string(tally.errors.size()) + " counts of errors, expected " +
+                    std::to_string(plan.countsOf(point)));
+    }
+    if (tally.blocks > plan.frames.to - plan.frames.from) {
+        refuseBeyond(result, fileName);
+    }
+    const FrameSet frames({plan.frames.from, plan.frames.from + tally.blocks});
+    for (const ErrorCounts& errors : tally.errors) {
+        if (const auto wrong = impossibleCount(frames, point.blockSize, errors, tally.clipped)) {
+            throw Error(place + ": " + *wrong);
+        }
+    }
+    if (!isPossibleTime(result.seconds)) {
+        throw Error(place + ": has taken no possible time");
+    }
+    if (isBeyond(plan, result)) {
+        refuseBeyond(result, fileName);
+    }
+}
+
+/// Throws Error unless the points are possible, and each is one that a run comes to.
+void checkOrder(const Plan& plan, const Checkpoint& checkpoint, const std::string& fileName)
+{
+    std::vector<PointResult> earlier;
+    const auto checkNext = [&](const PointResult& result) {
+        checkPoint(plan, result, fileName);
+        if (result.number != nextPoint(plan, earlier)) {
+            throw Error(fileName + ": point " + std::to_string(result.number) + ": is not the next one of this run");
+        }
+        earlier.push_back(result);
+    };
+    std::for_each(checkpoint.ended.begin(), checkpoint.ended.end(), checkNext);
+    if (checkpoint.running) {
+        checkNext(*checkpoint.running);
+    }
+    for (const PointResult& result : checkpoint.begun) {
+        checkPoint(plan, result, fileName);
+        if (!earlier.empty() && result.number <= earlier.back().number) {
+            throw Error(fileName + ": point " + std::to_string(result.number) + ": is there twice, or out of order");
+        }
+        earlier.push_back(result);
+    }
+}
+
+/// Parts the points where the first frame is missing.
+Standing parted(const Plan& plan, const std::vector<PointResult>& points)
+{
+    Standing standing;
+    for (const PointResult& point : points) {
+        const bool isNext = standing.begun.empty() && point.number == nextPoint(plan, standing.ended);
+        (isNext && hasEnded(plan, point) ? standing.ended : standing.begun).push_back(point);
+    }
+    return standing;
+}
+
+// ---- Points from rows
+
+using Rows = std::map<Point, const ResultRow*>;
+
+/// What the rows tell of a point of the plan.
+PointResult resultOf(const Plan& plan, std::size_t number, const Rows& rows)
+{
+    const Point& point = plan.points[number];
+    const std::size_t counts = plan.countsOf(point);
+    PointResult result = {number, Tally(counts), 0};
+    for (std::size_t i = 0; i < counts; ++i) {
+        Point wanted = point;
+        wanted.iterations -= static_cast<unsigned>(counts - 1 - i);
+        const auto found = rows.find(wanted);
+        if (found != rows.end()) {
+            const ResultRow& row = *found->second;
+            result.tally.errors[i] = row.errors;
+            result.tally.blocks = row.frames.size();
+            result.tally.clipped = row.clipped;
+            result.seconds = row.seconds;
+        }
+    }
+    return result;
+}
+
+/// What the points ended with; nothing if the results are not those of a complete run of all points.
+std::optional<std::vector<PointResult>> pointsOfComplete(const Plan& plan, const Results& results)
+{
+    Rows rows;
+    for (const ResultRow& row : results.rows) {
+        rows.emplace(row.point, &row);
+    }
+    std::vector<PointResult> points;
+    for (std::size_t next = 0; next < plan.points.size(); next = nextPoint(plan, points)) {
+        points.push_back(resultOf(plan, next, rows));
+    }
+    // What the points were not made from, such as the seed or other rows, shows in the text.
+    const bool isWhole =
+        std::all_of(points.begin(), points.end(), [](const PointResult& point) { return point.tally.blocks > 0; }) &&
+        csvText(resultsOf(plan, points)) == csvText(results);
+    return isWhole ? std::optional(points) : std::nullopt;
+}
+
+/// What the command of a result file, if it has that of a run, tells against going on with it.
+std::string obstacleIn(const std::string& command, const Plan& plan)
+{
+    const bool isTold = command.rfind("morvik ber ", 0) == 0;
+    return isTold ? obstaclesBetween(command, base::asUtf8(plan.command)) : "";
+}
+
+}  // namespace
+
+Standing standingOf(const Plan& plan, const Checkpoint& checkpoint, const std::string& fileName)
+{
+    checkOrder(plan, checkpoint, fileName);
+    std::vector<PointResult> points = checkpoint.ended;
+    if (checkpoint.running) {
+        points.push_back(*checkpoint.running);
+    }
+    points.insert(points.end(), checkpoint.begun.begin(), checkpoint.begun.end());
+    Standing standing = parted(plan, points);
+    if (checkpoint.command == base::asUtf8(plan.command) && standing.ended.size() < checkpoint.ended.size()) {
+        throw Error(fileName + ": point " + std::to_string(checkpoint.ended[standing.ended.size()].number) +
+                    ": is said to have ended, but has not");
+    }
+    return standing;
+}
+
+Standing standingOf(const Plan& plan, const Results& results, const std::string& fileName)
+{
+    const std::string obstacle = obstacleIn(results.command, plan);
+    const auto points = pointsOfComplete(plan, results);
+    if (!obstacle.empty() || !points) {
+        throw Error(fileName + ": holds other results" + (obstacle.empty() ? "" : " (" + obstacle + ')') +
+                    ", and there is no checkpoint to resume; --overwrite starts anew");
+    }
+    FrameSimulator simulator(plan, "");
+    for (const PointResult& point : *points) {
+        checkPoint(plan, point, fileName);
+        if (wasMetBefore(plan, point, simulator)) {
+            refuseBeyond(point, fileName);
+        }
+    }
+    return parted(plan, *points);
+}
+
+}  // namespace simulation
