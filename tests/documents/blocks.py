@@ -1,6 +1,7 @@
 """The fenced blocks of a Markdown file, with what the comments directly before each tell of its test.
 
     <!-- file: NAME -->         the block is the file NAME, which commands below use
+    <!-- simulate: NAME, ... -->  the file is a module that these simulators run; the block behind is what each prints
     <!-- check: COMMAND -->     runs COMMAND when the block has been run or written
     <!-- output -->             the block is what the commands before it print
     <!-- output of: COMMAND --> the block is what COMMAND prints
@@ -12,7 +13,7 @@
 import re
 from dataclasses import dataclass, field
 
-KINDS = ("file", "check", "output", "output of", "status", "cut", "not run")
+KINDS = ("file", "simulate", "check", "output", "output of", "status", "cut", "not run")
 WITHOUT_VALUE = ("output",)
 
 

@@ -22,6 +22,13 @@ sys.dont_write_bytecode = True  # the tree stays as it is
 from blocks import Mistake, blocks_of
 from scratch import TREE, copy_of_tree
 
+# How a simulator runs the module of a file that has its name, from a folder of its own for what it builds.
+SIMULATORS = {
+    "iverilog": "iverilog -o /tmp/{top}.vvp {file} && vvp -n /tmp/{top}.vvp",
+    "verilator": "verilator --binary --Mdir /tmp/{top} --top {top} {file} >/tmp/{top}.log && /tmp/{top}/V{top}",
+}
+OWN_LINES = re.compile(r"^(- )?\S+:\d+: (Verilog )?\$finish.*\n", re.MULTILINE)  # what they say of a simulation's end
+
 SPEEDS = ((r"\d[\d.]* (Mbit/s|blocks/s|s\b|seconds)", r"# \1"), (r" +\d+ +\d+:\d\d$", " #"))
 
 
@@ -72,6 +79,8 @@ class Document:
             self.compare(block)
         elif "file" in block.told:
             self.write(block, following)
+            if "simulate" in block.told:
+                self.simulate(block)
         elif block.language == "sh":
             self.printed = self.command(block, self.cut(block))
             self.promised(block)
@@ -120,10 +129,24 @@ class Document:
     def write(self, block, following):
         name = block.told["file"]
         users = [each.told.get("check", "") for each in following]
+        users += [block.told["file"]] if "simulate" in block.told else []
         users += [each.text for each in following[1:] if each.language == "sh" and "not run" not in each.told]
         if not any(name in each for each in users):
             raise Mistake(f"{block.place}: no command uses {name}")
         (self.scratch.folder / name).write_text(block.text)
+
+    def simulate(self, block):
+        """All simulators print the same."""
+        file = block.told["file"]
+        printed = {}
+        for name in block.told["simulate"].split(", "):
+            if name not in SIMULATORS:
+                raise Mistake(f"{block.place}: nobody knows the simulator {name}; there are {', '.join(SIMULATORS)}")
+            commands = SIMULATORS[name].format(file=file, top=file.split(".")[0])
+            printed[name] = OWN_LINES.sub("", self.command(block, commands))
+        self.printed = next(iter(printed.values()))
+        if any(each != self.printed for each in printed.values()):
+            raise Mistake(f"{block.place}: simulators differ: {printed}")
 
     def python(self, block):
         if ">>>" not in block.text:

@@ -43,6 +43,20 @@ class Documents(unittest.TestCase):
         for told in ("outptu", "output: x", "cut", "notrun: x"):
             self.refuses(block("true", told), "is nothing that a block can be told")
 
+    def test_a_module_is_run_by_each_simulator(self):
+        def module(statement, names="iverilog"):
+            text = f"module m; initial begin {statement} $finish; end endmodule"
+            return block(text, "file: m.v", f"simulate: {names}", language="verilog")
+
+        rows = block("printf '12\\n34\\n' >rows.memh")
+        beyond = 'reg [7:0] row [0:0]; initial $readmemh("rows.memh", row, 0, 0);'  # which Verilator does not take
+        self.run_document(module('$display("12");') + block("12", "output", language=""))
+        self.refuses(module('$display("12");') + block("13", "output", language=""), "is not what is printed")
+        self.refuses(module("no such statement"), "exit status")
+        self.refuses(module("", "icarus"), "nobody knows the simulator icarus")
+        self.run_document(rows + module("").replace("initial", f"{beyond} initial"))
+        self.refuses(rows + module("", "iverilog, verilator").replace("initial", f"{beyond} initial"), "beyond bounds")
+
     def test_output(self):
         def shown(printed, text, *told):
             return block(f"printf '{printed}'") + block(text, *(told or ("output",)), language="")
