@@ -1,4 +1,8 @@
-"""The arithmetic of the comparison: interpolation between points, and the uncertainty of what comes out."""
+"""The arithmetic of the comparison: interpolation between points, and the uncertainty of what comes out; and that the
+document has what the results give.
+
+    distances_test.py PROGRAMS    PROGRAMS is the folder of morvik and morvik_variants
+"""
 
 import math
 import pathlib
@@ -9,7 +13,8 @@ import unittest
 
 sys.dont_write_bytecode = True  # the tree stays as it is
 from distances import Estimate, Point, crossing, paired_step, read_curves, read_reference
-from validate import DOCUMENT, with_tables
+from needed import ITERATIONS, SIMULATIONS, TYPES, needed, pictures
+from validate import DOCUMENT, RESULTS, with_tables
 
 
 def curve(start, per_decade, blocks=1000000):
@@ -101,11 +106,31 @@ class Files(unittest.TestCase):
         self.assertEqual(curves, {("2",): [Point(1, 9, 3), Point(1.5, 9, 1)], ("4",): [Point(1, 9, 2)]})
 
 
+class Simulations(unittest.TestCase):
+    def test_of_few_bits_have_the_rate_for_all_iterations(self):
+        """The shortest form of `scripts/validate units` and `undivided`."""
+        for name, simulation in SIMULATIONS.items():
+            short = simulation._replace(scope=simulation.scope._replace(sizes=(40,), bits=100000))
+            with tempfile.TemporaryDirectory() as folder:
+                path = pathlib.Path(folder) / f"{name}.csv"
+                short.run(PROGRAMS, path)
+                found = needed(path)
+                header = path.read_text(encoding="utf-8").splitlines()[0]
+            self.assertEqual(set(found), {(40, algorithm, each) for algorithm in TYPES for each in ITERATIONS})
+            self.assertTrue(all(1 < estimate.db < 5 for estimate in found.values()), found)
+            self.assertEqual(header, (RESULTS / f"{name}.csv").read_text(encoding="utf-8").splitlines()[0])
+
+
 class Document(unittest.TestCase):
+    def test_has_the_pictures_that_the_results_give(self):
+        for name, picture in pictures(RESULTS).items():
+            self.assertEqual((DOCUMENT.parent / name).read_bytes(), picture, name)
+
     def test_has_the_tables_that_the_results_give(self):
         text = DOCUMENT.read_text(encoding="utf-8")
         self.assertEqual(with_tables(text), text)
 
 
 if __name__ == "__main__":
+    PROGRAMS = pathlib.Path(sys.argv.pop(1))
     unittest.main()

@@ -16,6 +16,7 @@ import tempfile
 
 sys.dont_write_bytecode = True  # the tree stays as it is
 from distances import crossing, paired_step, read_curves, read_reference, read_rows
+from needed import ITERATIONS, SIMULATIONS, division_table, needed_table, pictures
 from plot import draw
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
@@ -48,6 +49,7 @@ VARIANT_RUNS = {
          ["600,650,700,750", "400,450,500", "300,350,400,450"]))
     for algorithm, points in zip(("0", "1", "2"), by_algorithm)
 }
+ALL_RUNS = [*MODEL_RUNS, *VARIANT_RUNS, *SIMULATIONS]
 
 # Results, the reference with the same number of iterations, how the document calls it, and the types compared with it.
 COMPARISONS = (
@@ -159,7 +161,10 @@ def step_table():
 
 def with_tables(text):
     """The document with its tables anew: each stands between two comments with its name."""
-    for name, content in (("references", reference_table()), ("distances", distance_table()), ("steps", step_table())):
+    by_iterations = ["K", "type", *map(str, sorted(ITERATIONS))]
+    for name, content in (("references", reference_table()), ("distances", distance_table()), ("steps", step_table()),
+                          ("units", table(by_iterations, needed_table(RESULTS), 2)),
+                          ("undivided", table(by_iterations, division_table(RESULTS), 2))):
         begin, end = f"<!-- {name} -->\n", f"<!-- end of {name} -->"
         before, rest = text.split(begin)
         text = before + begin + content + end + rest.split(end)[1]
@@ -168,21 +173,25 @@ def with_tables(text):
 
 def main(arguments):
     if arguments != ["--tables"]:
-        programs, names = pathlib.Path(arguments[0]), arguments[1:] or [*MODEL_RUNS, *VARIANT_RUNS]
+        programs, names = pathlib.Path(arguments[0]), arguments[1:] or ALL_RUNS
         for name in names:
-            if name not in MODEL_RUNS and name not in VARIANT_RUNS:
-                sys.exit(f"validate: no simulation '{name}'; there are {', '.join([*MODEL_RUNS, *VARIANT_RUNS])}")
+            if name not in ALL_RUNS:
+                sys.exit(f"validate: no simulation '{name}'; there are {', '.join(ALL_RUNS)}")
         RESULTS.mkdir(exist_ok=True)
         with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
             try:
-                list(pool.map(lambda name: simulate(programs, name), names))
+                list(pool.map(lambda name: simulate(programs, name), [name for name in names if name not in SIMULATIONS]))
+                for name in SIMULATIONS.keys() & names:
+                    SIMULATIONS[name].run(programs, RESULTS / f"{name}.csv")
             except subprocess.CalledProcessError as error:
                 pool.shutdown(cancel_futures=True)
                 sys.exit(f"validate: {error}")
     DOCUMENT.write_text(with_tables(DOCUMENT.read_text(encoding="utf-8")), encoding="utf-8")
     PLOT.write_bytes(draw([("K = {}\\n{} iterations".format(*parts_of(results)), kind, algorithm, found)
                            for results, kind, algorithm, found in distances()]))
-    print(f"Tables: {DOCUMENT}\nPlot:   {PLOT}")
+    for name, picture in pictures(RESULTS).items():
+        (PLOT.parent / name).write_bytes(picture)
+    print(f"Tables: {DOCUMENT}\nPlots:  {PLOT}, {', '.join(pictures(RESULTS))}")
 
 
 if __name__ == "__main__":

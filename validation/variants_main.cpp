@@ -153,20 +153,65 @@ struct Options {
     std::vector<int> milliDecibels;
     std::uint64_t blockErrors = 300;
     std::uint64_t maxBlocks = 1000000;
+    std::vector<std::string> variants;  ///< names; if empty, all
 };
+
+/// Whether a variant takes part: the correction table is for three fraction bits alone.
+bool isSimulated(const Variant& variant, const Options& options)
+{
+    const bool hasTable = std::string(variant.stateFormat) == "Fix_12_3";
+    const auto& names = options.variants;
+    const bool isNamed = names.empty() || std::find(names.begin(), names.end(), variant.name) != names.end();
+    return isNamed && (options.algorithm != 2 || hasTable);
+}
+
+std::vector<std::string> variantNames()
+{
+    std::vector<std::string> names;
+    for (const Variant& variant : variants) {
+        names.emplace_back(variant.name);
+    }
+    return names;
+}
+
+/// The indices of the variants that take part.
+std::vector<std::size_t> simulatedVariants(const Options& options)
+{
+    std::vector<std::size_t> simulated;
+    for (std::size_t i = 0; i < variants.size(); ++i) {
+        if (isSimulated(variants[i], options)) {
+            simulated.push_back(i);
+        }
+    }
+    return simulated;
+}
+
+/// For each of the variants, the place of the nearest one before it on the way that takes part, or its own.
+std::vector<std::size_t> predecessorsOf(const std::vector<std::size_t>& simulated)
+{
+    std::vector<std::size_t> places;
+    for (std::size_t i = 0; i < simulated.size(); ++i) {
+        auto found = simulated.begin() + static_cast<std::ptrdiff_t>(i);
+        for (std::size_t before = simulated[i]; before > 0 && *found == simulated[i];) {
+            before = variants[before].predecessor;
+            const auto place = std::find(simulated.begin(), simulated.end(), before);
+            found = place != simulated.end() ? place : found;
+        }
+        places.push_back(static_cast<std::size_t>(found - simulated.begin()));
+    }
+    return places;
+}
 
 /// Decodes the blocks of a point until the first variant, the best one, has failed often enough. A disagreement is a
 /// block of which a variant and its predecessor decode but one.
 void simulatePoint(const Options& options, int milliDecibels)
 {
+    const std::vector<std::size_t> simulated = simulatedVariants(options);
+    const std::vector<std::size_t> predecessors = predecessorsOf(simulated);
     std::vector<VariantDecoder> decoders;
-    for (const Variant& variant : variants) {
-        // The correction table is for three fraction bits alone.
-        if (options.algorithm != 2 || std::string(variant.stateFormat) == "Fix_12_3") {
-            decoders.emplace_back(variant, options.algorithm);
-        }
+    for (const std::size_t variant : simulated) {
+        decoders.emplace_back(variants[variant], options.algorithm);
     }
-    const std::size_t skipped = variants.size() - decoders.size();
     const double scale = defaultScale(options.algorithm, options.blockSize, milliDecibels);
     std::vector<std::uint64_t> errors(decoders.size());
     std::vector<std::uint64_t> disagreements(decoders.size());
@@ -177,15 +222,14 @@ void simulatePoint(const Options& options, int milliDecibels)
         blocks.make(count);
         for (std::size_t i = 0; i < decoders.size(); ++i) {
             failed[i] = !decoders[i].decodes(blocks.received, scale, options.iterations, blocks.sent);
-            const std::size_t predecessor = std::max(variants[skipped + i].predecessor, skipped) - skipped;
             errors[i] += failed[i] ? 1U : 0U;
-            disagreements[i] += failed[i] != failed[predecessor] ? 1U : 0U;
+            disagreements[i] += failed[i] != failed[predecessors[i]] ? 1U : 0U;
         }
     }
     for (std::size_t i = 0; i < decoders.size(); ++i) {
         std::printf("%u,%s,%d,%u,%.3f,%llu,%llu,%llu\n",
                     options.blockSize,
-                    variants[skipped + i].name,
+                    variants[simulated[i]].name,
                     options.algorithm,
                     options.iterations,
                     milliDecibels / 1000.0,
@@ -210,6 +254,9 @@ int main(int argc, char** argv)
         ->required();
     app.add_option("--block-errors", options.blockErrors, "End a point when the first variant has failed so often");
     app.add_option("--max-blocks", options.maxBlocks, "End a point with the block N");
+    app.add_option("--variants", options.variants, "Which variants, by name; all without it")
+        ->delimiter(',')
+        ->check(CLI::IsMember(variantNames()));
     CLI11_PARSE(app, argc, argv);
     try {
         std::puts("block_size,variant,algorithm,iterations,ebn0_db,blocks,block_errors,disagreements");
