@@ -1,0 +1,176 @@
+"""Mutants: where mistakes are made in the model, which ones, and which of them change nothing that can be seen."""
+
+import pathlib
+import re
+from typing import NamedTuple
+
+ROOT = pathlib.Path(__file__).resolve().parent.parent
+
+# Where mistakes are made: files, and of them all or the named functions alone.
+PLACES = {
+    "src/Arithmetic.h": None,
+    "src/Trellis.h": None,
+    "src/TrellisDecision.h": None,
+    "src/Segmentation.cpp": None,
+    "src/TCalculationEngineModBase.cpp": ["lutEntry", "forward", "backward", "ratios", "mod_gamma", "createLUT"],
+    "src/TDecoder3G.cpp": ["intrinsicValue", "scaled", "extract", "appendParity", "interleaveSystematic",
+                           "preparePermutation", "permutation", "calcSISO", "startExtrinsic", "calcIntrinsic",
+                           "calcGamma", "calcAlpha", "calcBeta", "calcLLR", "calcExtrinsic", "setInitialState",
+                           "hardDecisions"],
+    "src/TDecoder3G.h": ["constituent"],
+    "src/TDecoder3GPU.cpp": ["border", "allocate", "buildSegments", "calcGamma", "calcAlpha", "initialiseAlpha",
+                             "calcBeta", "initialiseBeta", "runWindow", "windowStartingWhereEnds", "preCalcBetaTail"],
+    "src/TInterleaver3GPPLTE.cpp": ["calcInterleaver"],
+    "src/TNumberFormat.cpp": ["halfRange", "TNumberFormat", "place", "integer", "real"],
+    "src/SimulationCall.cpp": ["inputInteger", "reportSaturation", "convert", "truncateTag", "withSoftValues",
+                               "decodeByComponents", "countByComponents", "lanesTake", "loadLanes"],
+    "src/LanePath.cpp": None,
+    "src/morvik_v1_0_batch.cpp": ["block", "tag", "shortArray", "deliverTag", "runByComponents", "runByLanes", "fault",
+                                  "countAllByComponents", "differences", "countAllByLanes"],
+    "src/morvik_v1_0_bitacc_cmodel.cpp": ["create_default_state"],
+    "lanes/InstructionSets.cpp": None,
+    "lanes/Kernels.cpp": None,
+    "lanes/LaneDecoder.cpp": None,
+    "lanes/LaneOrder.h": None,
+    "lanes/Pass.h": None,
+    "lanes/Permute.h": None,
+    "lanes/Rules.h": None,
+    "lanes/Transpose.h": None,
+    "lanes/Words.h": None,
+    "standard/BlockSizes.h": ["findBlockSize"],
+}
+
+# What is put in the place of what: operators with a space on both sides or at the end of their line, and words.
+SWAPS = [("+", "-"), ("-", "+"), ("<", "<="), ("<=", "<"), (">", ">="), (">=", ">"), ("==", "!="), ("!=", "=="),
+         ("&&", "||"), ("||", "&&"), ("*", "+"), ("/", "*"), ("^", "|"), ("&", "|"), ("|", "&"), ("<<", ">>"),
+         (">>", "<<"), ("%", "/"), ("+=", "-="), ("-=", "+=")]
+WORDS = [("add", "subtract"), ("subtract", "add"), ("addWrap", "subWrap"), ("subWrap", "addWrap"), ("odd", "even"),
+         ("even", "odd"), ("one", "zero"), ("c1", "c2"), ("c2", "c1"), ("from", "to"), ("to", "from"),
+         ("lo", "hi"), ("itsMin", "itsMax"), ("itsMinQ", "itsMaxQ"), ("itsMaxQ", "itsMinQ")]
+
+# Mutants that change nothing that can be seen: of each file why, and the old and new line of each, cut to what matters.
+EQUIVALENT = {
+    "src/Arithmetic.h": [
+        ("a value that equals the limit becomes the limit",
+         [("value < lo ?", "value <= lo ?"), ("hi < value ?", "hi <= value ?")]),
+    ],
+    "src/Trellis.h": [
+        ("every bit that is not 0 is bit 1",
+         [("predecessor(state, 1)", "predecessor(state, 2)"), ("bestPath<1>", "bestPath<2>")]),
+        ("the two predecessors of a state are a pair and share a branch metric", [("branch(one);", "branch(zero);")]),
+        ("an array with an element more", [("Metric, 4> pair", "Metric, 5> pair")]),
+    ],
+    "src/Segmentation.cpp": [
+        ("127 and 128 steps are halved to 64 as well",
+         [("rest >= 128", "rest >= 129"), ("rest >= 128", "rest >= 127"), ("rest >= 128", "rest > 128")]),
+    ],
+    "src/TCalculationEngineModBase.cpp": [
+        ("eight points resolve log2 8 - 3 = 0 fraction bits, as fewer do", [("log2Range > 2 ?", "log2Range > 3 ?")]),
+    ],
+    "src/TDecoder3G.cpp": [
+        ("a value that equals the limit becomes the limit", [("product > lo ?", "product >= lo ?")]),
+        ("half of 1 is 0",
+         [("itsExtrinsic.end(), short{0}", "itsExtrinsic.end(), short{1}"),
+          ("itsExtrinsic[from[j]] : 0", "itsExtrinsic[from[j]] : 1")]),
+    ],
+    "src/TDecoder3GPU.cpp": [
+        ("the first passes start from zeros whatever these columns hold, and store each of them; the last is the tail's",
+         [("unsigned i = 0; i + 1 < starts.size()", new) for new in (
+             "unsigned i = 1; i + 1 < starts.size()", "unsigned i = 0; i + 2 < starts.size()",
+             "unsigned i = 0; i + 0 < starts.size()", "unsigned i = 0; i - 1 < starts.size()",
+             "unsigned i = 0; i + 1 <= starts.size()")]),
+    ],
+    "src/TInterleaver3GPPLTE.cpp": [
+        ("no step of a permutation is 0, and only its first position",
+         [("position >= K", "position > K"), ("step >= K", "step > K")]),
+    ],
+    "src/TNumberFormat.cpp": [
+        ("a value that equals the limit becomes the limit",
+         [("q < itsMinQ", "q <= itsMinQ"), ("q > itsMaxQ", "q >= itsMaxQ")]),
+        ("values that the constructor replaces",
+         [("itsMin(0)", "itsMin(1)"), ("itsMax(0)", "itsMax(1)"), ("itsMask(0)", "itsMask(1)")]),
+    ],
+    "src/LanePath.cpp": [
+        ("the three streams of a block are of one length", [("past.input[0].size()", "past.input[1].size()")]),
+    ],
+}
+
+
+class Mutant(NamedTuple):
+    file: str
+    line: int  # from 0
+    original: str
+    changed: str
+
+    @property
+    def place(self):
+        return f"{self.file}:{self.line + 1}"
+
+
+def function_lines(text, name):
+    """The lines of the functions of that name: from a line with the name and an opening parenthesis, without a
+    semicolon at its end, to the closing brace in the same column as the opening one."""
+    lines = text.split("\n")
+    found = set()
+    for start, line in enumerate(lines):
+        if not re.search(rf"\b{name}\(", line) or line.startswith("//") or line.rstrip().endswith(";"):
+            continue
+        opening = next((i for i in range(start, min(start + 14, len(lines))) if re.fullmatch(r" *\{", lines[i])), None)
+        if opening is None or any(";" in lines[i] for i in range(start, opening)):
+            continue
+        closing = lines[opening].replace("{", "}")
+        end = next(i for i in range(opening, len(lines)) if lines[i] == closing)
+        found.update(range(start, end))
+    assert found, f"no function {name}"
+    return found
+
+
+def code(line):
+    """The line with comments and texts blanked, so that nothing in them is changed."""
+    line = re.sub(r'"[^"]*"', lambda m: " " * len(m.group()), line)
+    return re.sub(r"//.*", lambda m: " " * len(m.group()), line)
+
+
+def mutations(line):
+    """Pairs of place and new text: start, end, replacement."""
+    text = code(line)
+    if text.lstrip().startswith(("#", "template", "using", "static_assert")):
+        return
+    for match in re.finditer(r"(?<![\w.])\d+(?=[UL]*\b)(?![\w]*\.)", text):
+        value = int(match.group())
+        yield match.start(), match.end(), str(value + 1)
+        if value > 0:
+            yield match.start(), match.end(), str(value - 1)
+    for match in re.finditer(r"\b\d+\.\d+", text):
+        for factor in (0.5, 2):
+            yield match.start(), match.end(), repr(float(match.group()) * factor)
+    for match in re.finditer(r"0x[0-9A-F]+", text):
+        yield match.start(), match.end(), hex(int(match.group(), 16) ^ 0x80)
+    for old, new in SWAPS:
+        for match in re.finditer(rf"(?<= ){re.escape(old)}(?= |$)", text):
+            yield match.start(), match.end(), new
+    for match in re.finditer(r"(?<=[(\[{, ])-(?=[\w(])", text):
+        yield match.start(), match.end(), "+"
+    for match in re.finditer(r"\+\+|--", text):
+        yield match.start(), match.end(), "--" if match.group() == "++" else "++"
+    for match in re.finditer(r"~(?=[\w(])", text):
+        yield match.start(), match.end(), ""
+    for old, new in WORDS:
+        for match in re.finditer(rf"(?<![\w:]){old}\b(?!:)", text):
+            yield match.start(), match.end(), new
+
+
+def all_mutants():
+    for name, functions in PLACES.items():
+        text = (ROOT / name).read_text()
+        lines = text.split("\n")
+        numbers = range(len(lines)) if functions is None else sorted(
+            set().union(*(function_lines(text, function) for function in functions)))
+        for number in numbers:
+            for start, end, new in mutations(lines[number]):
+                yield Mutant(name, number, lines[number], lines[number][:start] + new + lines[number][end:])
+
+
+def equivalent(mutant):
+    return any(mutant.original.replace(old, new) == mutant.changed
+               for _, pairs in EQUIVALENT.get(mutant.file, []) for old, new in pairs if old in mutant.original)
