@@ -5,13 +5,17 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdlib>
+#include <exception>
 #include <iostream>
 #include <streambuf>
 #include <string>
+#include <string_view>
 
 /// Reads zeros when the bytes are used up.
 class FuzzInput {
 public:
+    static constexpr std::string_view partEnd = "\n\x1E\n";
+
     FuzzInput(const std::uint8_t* data, std::size_t size) : itsNext(data), itsEnd(data + size) {}
 
     bool empty() const
@@ -52,6 +56,15 @@ public:
             taken += static_cast<char>(byte());
         }
         return taken;
+    }
+
+    /// What stands before the next partEnd, or all that is left.
+    std::string part()
+    {
+        const std::string rest(itsNext, itsEnd);
+        const std::size_t end = rest.find(partEnd);
+        itsNext = end == std::string::npos ? itsEnd : itsNext + end + partEnd.size();
+        return rest.substr(0, end);
     }
 
     /// All that is left.
@@ -101,6 +114,13 @@ inline void require(bool kept, const char* promise)
         std::cerr << "broken: " << promise << std::endl;
         std::abort();
     }
+}
+
+/// A message is one line that opens with the place.
+inline void requireOneLine(const std::exception& error, const std::string& opening)
+{
+    const std::string line = error.what();
+    require(line.rfind(opening, 0) == 0 && line.find('\n') == std::string::npos, "an error is one line with its place");
 }
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size);

@@ -20,9 +20,7 @@ void readBlocks(const std::string& text)
                     "the three streams are of one length");
         }
     } catch (const morvik::FileError& error) {
-        const std::string line = error.what();
-        require(line.rfind("in:", 0) == 0 && line.find('\n') == std::string::npos,
-                "an error is one line with its place");
+        requireOneLine(error, "in:");
     }
 }
 
@@ -36,9 +34,7 @@ void readBits(const std::string& text)
         }
         reference.expectEnd();
     } catch (const morvik::FileError& error) {
-        const std::string line = error.what();
-        require(line.rfind("in:", 0) == 0 && line.find('\n') == std::string::npos,
-                "an error is one line with its place");
+        requireOneLine(error, "in:");
     }
 }
 

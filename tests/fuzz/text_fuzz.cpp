@@ -1,13 +1,9 @@
 // text_fuzz: the text and value utilities take any text and number, and keep what Misc.h promises.
-#include <unistd.h>
-
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
-#include <filesystem>
-#include <fstream>
 #include <iterator>
 #include <limits>
 #include <map>
@@ -18,6 +14,7 @@
 
 #include "FuzzInput.h"
 #include "Misc.h"
+#include "TemporaryFiles.h"
 
 namespace {
 
@@ -29,35 +26,10 @@ bool isBlank(char c)
     return code <= 32 || code >= 128;
 }
 
-/// A file of the given content that lives as long as the object.
-class TemporaryFile {
-public:
-    explicit TemporaryFile(const std::string& content)
-        : itsName(std::filesystem::temp_directory_path() / ("morvik_text_fuzz_" + std::to_string(getpid())))
-    {
-        std::ofstream(itsName, std::ios::binary) << content;
-    }
-
-    ~TemporaryFile()
-    {
-        std::filesystem::remove(itsName);
-    }
-
-    TemporaryFile(const TemporaryFile&) = delete;
-    TemporaryFile& operator=(const TemporaryFile&) = delete;
-
-    const std::string& name() const
-    {
-        return itsName;
-    }
-
-private:
-    std::string itsName;
-};
-
 void parseParameters(const std::string& text)
 {
-    const TemporaryFile file(text);
+    const TemporaryFiles files;
+    const std::string file = files.write("parameters", text);
     for (const bool checkNames : {true, false}) {
         Parameters fromStream = {{"a", "1"}, {"b", ""}};
         Parameters fromFile = fromStream;
@@ -65,12 +37,10 @@ void parseParameters(const std::string& text)
         const bool accepted = parse(stream, fromStream, checkNames);
         require(accepted || checkNames, "without checking nothing is refused");
         require(!checkNames || fromStream.size() == 2, "checking names adds none");
-        require(parse(file.name(), fromFile, checkNames) == accepted && fromFile == fromStream,
-                "a file reads like a stream");
+        require(parse(file, fromFile, checkNames) == accepted && fromFile == fromStream, "a file reads like a stream");
     }
     Parameters untouched;
-    require(!parse(file.name() + "/" + text, untouched, false) && untouched.empty(),
-            "what cannot be opened is refused");
+    require(!parse(file + "/" + text, untouched, false) && untouched.empty(), "what cannot be opened is refused");
 }
 
 void tidy(const std::string& text)

@@ -1,0 +1,75 @@
+// vectors_fuzz: the readers of sets of vectors take any files: the manifest, and the tables in every format.
+#include <filesystem>
+
+#include "FuzzInput.h"
+#include "TemporaryFiles.h"
+#include "simulation/Error.h"
+#include "vectors/BlockFiles.h"
+#include "vectors/Manifest.h"
+
+namespace {
+
+using namespace morvik::vectors;
+
+void readManifest(const std::string& text)
+{
+    try {
+        const Manifest manifest = parseManifest(text, "in");
+        const Manifest again = parseManifest(manifestText(manifest), "in");
+        require(manifestText(again) == manifestText(manifest), "what was read is written, and read again");
+        for (const ManifestFormat& format : manifest.formats) {
+            for (const ManifestFile& file : format.files) {
+                require(file.name == std::filesystem::path(file.name).filename(), "a file lies in the folder");
+            }
+        }
+    } catch (const simulation::Error& error) {
+        requireOneLine(error, "in");
+    }
+}
+
+Settings takeSettings(FuzzInput& input)
+{
+    const unsigned choice = input.byte();
+    Settings settings;
+    settings.iterations = 1;
+    settings.width = (choice & 1U) != 0 ? 16 : 8;
+    settings.separateStreams = (choice & 2U) != 0;
+    settings.ratios = (choice & 4U) != 0;
+    settings.internal = (choice & 8U) != 0;
+    return settings;
+}
+
+/// The files of a format, in their order, are the parts of the input.
+void readBlocks(FuzzInput& input)
+{
+    const Format& format = formats()[input.below(static_cast<unsigned>(formats().size()))];
+    const Settings settings = takeSettings(input);
+    TemporaryFiles files;
+    for (const Table& table : Layout(format, settings).tables) {
+        files.write(format.files(table).front(), input.part());
+    }
+    try {
+        BlockReader reader(files.folder(), format, settings);
+        Stimulus stimulus;
+        Expected expected;
+        while (reader.next(stimulus, expected)) {
+            require(stimulus.streams[2].size() == stimulus.K + 4, "a block has K + 4 positions");
+            require(expected.bits.size() == stimulus.K, "a block has K decisions");
+        }
+    } catch (const simulation::Error& error) {
+        requireOneLine(error, files.folder() + '/');
+    }
+}
+
+}  // namespace
+
+int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
+{
+    FuzzInput input(data, size);
+    if (input.below(2) == 0) {
+        readManifest(input.text());
+    } else {
+        readBlocks(input);
+    }
+    return 0;
+}
