@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # Runs at a desk what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
-# Stages: format lint lint-tests docs compilers abi memory threads fuzz coverage tests, and only when they are named:
-# abi-renew mutate packages
+# Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are named:
+# abi-renew mutate packages starts
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -66,11 +66,14 @@ stage_abi() {
 stage_abi-renew() {
     local bits
     for bits in 64 32; do
-        scripts/build abi-$bits morvik_v1_0_bitacc_cmodel
-        abidw --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
-            --headers-dir include --headers-dir src "$(library_of $bits)" |
-            xz -9 >"tests/data/abi.$bits.xml.xz"
+        write_abi "$bits" "tests/data/abi.$bits.xml.xz"
     done
+}
+
+write_abi() {
+    scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel
+    abidw --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
+        --headers-dir include --headers-dir src "$(library_of "$1")" | xz -9 >"$2"
 }
 
 library_of() {
@@ -97,33 +100,44 @@ stage_threads() {
     build/threads/tests/simulation_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
 }
 
-# Every fuzzer on its corpus and some thousand inputs more. FUZZ_SECONDS gives each a time instead;
-# FUZZ_CORPUS names a folder that keeps what long runs find, and where the next run goes on.
-stage_fuzz() {
-    local fuzzers=(csv_fuzz property_strings_fuzz results_fuzz simulate_fuzz state_fuzz text_fuzz)
+# Every fuzzer on its corpus and some thousand inputs made of it, always the same ones. HOSTILE_SECONDS gives each a
+# time instead, and other inputs; HOSTILE_CORPUS names a folder that keeps what long runs find, and where the next run
+# goes on.
+stage_hostile() {
+    local fuzzers
+    mapfile -t fuzzers < <(sed -n '/^foreach(fuzzer/,/)$/s/^ *\([a-z_]*_fuzz\).*/\1/p' tests/fuzz/CMakeLists.txt)
     scripts/build fuzz "${fuzzers[@]}"
-    local fuzzer log=build/fuzz/log corpus=${FUZZ_CORPUS:-}
+    local corpus=${HOSTILE_CORPUS:-}
     if [ -z "$corpus" ]; then
         corpus=$(mktemp -d)
         trap 'rm -rf "$corpus"; trap - RETURN' RETURN
     fi
-    for fuzzer in "${fuzzers[@]}"; do
-        local limit=(-runs=2000)
-        [ -z "${FUZZ_SECONDS:-}" ] || limit=(-max_total_time="$FUZZ_SECONDS")
-        mkdir -p "$corpus/$fuzzer"
-        "build/fuzz/tests/$fuzzer" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/fuzz/" \
-            "$corpus/$fuzzer" "tests/fuzz/corpus/$fuzzer" >"$log" 2>&1 || { tail -n 60 "$log"; return 1; }
-        echo "$fuzzer: $(sed -n 's/.*number_of_executed_units: *//p' "$log") executions"
-    done
+    export -f fuzz
+    printf '%s\n' "${fuzzers[@]}" | xargs -P "$(nproc)" -n 1 bash -euo pipefail -c 'fuzz "$@"' fuzz "$corpus"
+}
+
+# fuzz CORPUS FUZZER
+fuzz() {
+    local limit=(-runs=4000 -seed=36212) log=build/fuzz/$2.log
+    [ -z "${HOSTILE_SECONDS:-}" ] || limit=(-max_total_time="$HOSTILE_SECONDS")
+    [ ! -e "tests/fuzz/dictionaries/$2.dict" ] || limit+=(-dict="tests/fuzz/dictionaries/$2.dict")
+    mkdir -p "$1/$2"
+    "build/fuzz/tests/$2" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/fuzz/" \
+        "$1/$2" "tests/fuzz/corpus/$2" >"$log" 2>&1 || { tail -n 60 "$log"; return 1; }
+    echo "$2: $(sed -n 's/.*number_of_executed_units: *//p' "$log") executions"
 }
 
 stage_coverage() {
     scripts/build coverage
     find build/coverage -name '*.gcda' -delete
     scripts/run-tests coverage -L '^(unit|library)$'
-    gcovr --root . --filter src/ --exclude-throw-branches --exclude-unreachable-branches \
-        --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
+    count_lines src/
     echo "Details: build/coverage/report.html"
+}
+
+count_lines() {
+    gcovr --root . --filter "$1" --exclude-throw-branches --exclude-unreachable-branches \
+        --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
 }
 
 # Not among the stages that run without being named: it takes most of an hour.
@@ -137,15 +151,34 @@ stage_packages() {
     tests/packages/clean_root.sh build/packages
 }
 
+# The shortest form of what nobody runs every day, so that it still runs on the day that somebody does.
+stage_starts() {
+    tidy tests/builds/digest.cpp bench/Limits.cpp
+    local preset
+    for preset in clang clang-32; do
+        scripts/build "$preset" lanes_objects header_test
+    done
+    write_abi 64 build/abi-64.renewed.xml.xz
+    cmp build/abi-64.renewed.xml.xz tests/data/abi.64.xml.xz
+    scripts/build coverage TNumberFormat_test
+    build/coverage/tests/TNumberFormat_test --gtest_brief=1
+    count_lines src/TNumberFormat.cpp
+    scripts/mutate --only src/Segmentation.cpp:23 --every 10 --anew
+    scripts/packages x86_64
+    scripts/validate --tables
+    scripts/renew-results
+    git diff --exit-code docs/validation.md tests/data/ber
+}
+
 stage_tests() {
     ./test
 }
 
 scripts/setup --checks --tests
-[ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads fuzz coverage tests
+[ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads hostile coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads fuzz coverage tests abi-renew mutate packages" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads hostile coverage tests abi-renew mutate packages starts" >&2
         exit 2
     fi
     echo "== $stage"
