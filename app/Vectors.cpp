@@ -104,8 +104,8 @@ int check(const std::string& path)
         print(opening + *set.difference + '\n');
         return differencesFound;
     }
-    print(opening + blocksAndFormats(set.manifest) +
-          ", all as the model decodes them: " + comparedText(set.compared) + '\n');
+    print(opening + blocksAndFormats(set.manifest) + ", all as the model decodes them: " + comparedText(set.compared) +
+          '\n');
     return success;
 }
 
