@@ -81,7 +81,7 @@ std::string signalNames(const std::vector<unsigned>& signals)
     return listed(signals, name, inRow);
 }
 
-std::string plural(const char* noun, std::size_t count)
+std::string plural(const char* noun, std::uint64_t count)
 {
     return noun + std::string(count == 1 ? " " : "s ");
 }
