@@ -17,8 +17,6 @@ namespace {
 using base::Json;
 using base::JsonMembers;
 
-constexpr std::string_view opening = "morvik checkpoint ";
-
 /// The FNV-1a hash in hexadecimal.
 std::string checksum(std::string_view text)
 {
@@ -103,6 +101,11 @@ Json jsonOf(const std::vector<PointResult>& points)
 
 }  // namespace
 
+std::string checkpointOpening(const std::string& body)
+{
+    return "morvik checkpoint " + checksum(body) + '\n';
+}
+
 std::string checkpointText(const Checkpoint& checkpoint)
 {
     Json json = {{"version", checkpoint.version},
@@ -113,7 +116,7 @@ std::string checkpointText(const Checkpoint& checkpoint)
         json["running"] = jsonOf(*checkpoint.running);
     }
     const std::string body = json.dump(1, ' ', false, Json::error_handler_t::replace) + '\n';
-    return std::string(opening) + checksum(body) + '\n' + body;
+    return checkpointOpening(body) + body;
 }
 
 std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::string& fileName)
@@ -123,7 +126,7 @@ std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::st
         return std::nullopt;
     }
     const std::string body = text.substr(lineEnd + 1);
-    if (text.substr(0, lineEnd) != std::string(opening) + checksum(body)) {
+    if (text.substr(0, lineEnd + 1) != checkpointOpening(body)) {
         return std::nullopt;
     }
     const Json json = base::parseJson('\n' + body, fileName);  // with the lines as in the file

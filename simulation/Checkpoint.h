@@ -18,6 +18,9 @@ struct Checkpoint {
     std::vector<PointResult> begun;  // later points, which an earlier run with smaller limits has counted
 };
 
+/// The line with the checksum that a checkpoint opens with, before the rest of it.
+std::string checkpointOpening(const std::string& body);
+
 /// The text, which opens with a checksum.
 std::string checkpointText(const Checkpoint& checkpoint);
 
