@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # Runs at a desk what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
-# Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are named:
-# abi-renew mutate packages starts
+# Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
+# named: abi-renew mutate packages starts
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -57,9 +57,13 @@ stage_abi() {
     local bits
     for bits in 64 32; do
         scripts/build abi-$bits morvik_v1_0_bitacc_cmodel
-        xz --decompress --stdout "tests/data/abi.$bits.xml.xz" >"build/abi-$bits.xml"
-        abidiff "build/abi-$bits.xml" "$(library_of $bits)"
+        compare_abi "$bits" "tests/data/abi.$bits.xml.xz"
     done
+}
+
+compare_abi() {
+    xz --decompress --stdout "$2" >"build/abi-$1.xml"
+    abidiff "build/abi-$1.xml" "$(library_of "$1")"
 }
 
 # Makes the interface as it is now the committed one, after an intended change.
@@ -118,7 +122,8 @@ stage_hostile() {
 
 # fuzz CORPUS FUZZER
 fuzz() {
-    local limit=(-runs=4000 -seed=36212) log=build/fuzz/$2.log
+    local limit=(-runs=4000 -seed=36212)
+    local log=build/fuzz/$2.log
     [ -z "${HOSTILE_SECONDS:-}" ] || limit=(-max_total_time="$HOSTILE_SECONDS")
     [ ! -e "tests/fuzz/dictionaries/$2.dict" ] || limit+=(-dict="tests/fuzz/dictionaries/$2.dict")
     mkdir -p "$1/$2"
@@ -159,7 +164,7 @@ stage_starts() {
         scripts/build "$preset" lanes_objects header_test
     done
     write_abi 64 build/abi-64.renewed.xml.xz
-    cmp build/abi-64.renewed.xml.xz tests/data/abi.64.xml.xz
+    compare_abi 64 build/abi-64.renewed.xml.xz
     scripts/build coverage TNumberFormat_test
     build/coverage/tests/TNumberFormat_test --gtest_brief=1
     count_lines src/TNumberFormat.cpp
