@@ -91,7 +91,16 @@ EQUIVALENT = {
          [("itsMin(0)", "itsMin(1)"), ("itsMax(0)", "itsMax(1)"), ("itsMask(0)", "itsMask(1)")]),
     ],
     "src/LanePath.cpp": [
+        ("a last block of the same size is dropped again at once", [("K < lastK", "K <= lastK")]),
         ("the three streams of a block are of one length", [("past.input[0].size()", "past.input[1].size()")]),
+    ],
+    "lanes/Kernels.cpp": [
+        ("a row of no lanes is never chosen, and one of more lanes costs time alone",
+         [("Shape<8, 1, 2>::kernel", "Shape<8, 0, 2>::kernel"), ("Shape<8, 2>::kernel", "Shape<8, 3>::kernel")]),
+    ],
+    "lanes/Permute.h": [
+        ("of an index word, the low five bits alone count",
+         [("control[2 * lane + 1] = 0", "control[2 * lane + 1] = 1")]),
     ],
 }
 
