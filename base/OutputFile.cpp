@@ -105,7 +105,9 @@ OutputFile::OutputFile(const std::string& name) : itsName(name == standardStream
         itsFile = Descriptor(open(place.path.c_str(), O_WRONLY | O_NOCTTY | O_CLOEXEC));
     } else if (access(place.path.c_str(), W_OK) == 0) {
         openNew(place.path, old.st_mode & permissions);
-        itsFile.allow(old.st_mode & permissions);  // not every file system can; it has no more of them in any case
+        if (itsFile.isOpen()) {
+            itsFile.allow(old.st_mode & permissions);  // not every file system can; it has no more of them in any case
+        }
     }
     if (!itsFile.isOpen()) {
         fail();

@@ -3,6 +3,7 @@
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -227,6 +228,19 @@ TEST_F(OutputFile, KeepsTheOldContentWhenTheDiskIsFull)
     EXPECT_EQ(reason, file + ": cannot be written: File too large");
     EXPECT_EQ(folder.read("file.csv"), std::string(1000, 'y'));
     EXPECT_EQ(everythingIn(folder), Names{"file.csv"});
+}
+
+TEST_F(OutputFile, TellsWhyItCannotTakeThePlaceOfAnother)
+{
+    folder.write("file.csv", "old\n");
+    rlimit old = {};
+    getrlimit(RLIMIT_NOFILE, &old);
+    const rlimit none = {0, old.rlim_max};
+    setrlimit(RLIMIT_NOFILE, &none);
+    const std::string reason = refusal(file, "new\n");
+    setrlimit(RLIMIT_NOFILE, &old);
+    EXPECT_EQ(reason, file + ": cannot be written: Too many open files");
+    EXPECT_EQ(folder.read("file.csv"), "old\n");
 }
 
 TEST_F(OutputFile, IsRefusedWithoutAName)
