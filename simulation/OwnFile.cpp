@@ -2,6 +2,7 @@
 #include "OwnFile.h"
 
 #include <fcntl.h>
+#include <sys/stat.h>
 
 #include <utility>
 
@@ -10,12 +11,26 @@
 
 namespace simulation {
 
+namespace {
+
+/// Links included, wherever they lead.
+void refuseOtherThanFile(const std::string& fileName)
+{
+    struct stat found = {};
+    if (lstat(fileName.c_str(), &found) == 0 && !S_ISREG(found.st_mode)) {
+        throw Error(fileName + ": is no regular file, and is not replaced");
+    }
+}
+
+}  // namespace
+
 OwnFile::OwnFile(std::string fileName) : itsName(std::move(fileName)), itsFile(-1)
 {
+    refuseOtherThanFile(itsName);
     // Between the two steps the file may have gone, or another may have taken its place, with the lock on that one.
     constexpr int patience = 100;  // with a file system that tells files apart by nothing steady
     for (int i = 0; i < patience && !itsIsTaken && !itsFile.isAt(itsName); ++i) {
-        itsFile = base::Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0666));
+        itsFile = base::Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
         itsIsTaken = itsFile.isOpen() && !itsFile.lock();
     }
 }
@@ -39,6 +54,7 @@ bool OwnFile::isNew() const
 
 void OwnFile::write(const std::string& content)
 {
+    refuseOtherThanFile(itsName);
     base::OutputFile file(itsName);
     file.lock();  // before it has the name
     file.secure();

@@ -13,7 +13,8 @@ namespace simulation {
 /// object if it never is.
 class OwnFile {
 public:
-    /// If another process has the file, isTaken() tells. If it cannot be opened, writing will tell.
+    /// If another process has the file, isTaken() tells. If it cannot be opened, writing will tell. Throws Error where
+    /// there is something else than a regular file: a link would lead to somebody else's.
     explicit OwnFile(std::string fileName);
     OwnFile(const OwnFile&) = delete;
     OwnFile& operator=(const OwnFile&) = delete;

@@ -6,6 +6,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <filesystem>
+
 #include "simulation/Error.h"
 #include "support/TemporaryFolder.h"
 
@@ -87,6 +89,22 @@ TEST_F(OwnFiles, ThatCannotBeOpenedTellWhenTheyAreWritten)
     OwnFile file(folder.path("none/file"));
     EXPECT_FALSE(file.isTaken());
     EXPECT_THROW(file.write("x"), simulation::Error);
+}
+
+TEST_F(OwnFiles, AreNoLinksToOthers)
+{
+    folder.write("another", "kept");
+    std::filesystem::create_symlink("another", name);
+    EXPECT_THROW(OwnFile{name}, simulation::Error);
+    unlink(name.c_str());
+    {
+        OwnFile file(name);
+        unlink(name.c_str());
+        std::filesystem::create_symlink("another", name);
+        EXPECT_THROW(file.write("x"), simulation::Error);
+    }
+    EXPECT_EQ(folder.read("another"), "kept");
+    EXPECT_EQ(folder.names(), (std::vector<std::string>{"another", "file"}));
 }
 
 }  // namespace
