@@ -315,9 +315,16 @@ private:
         }
         itsText +=
             itsComparison.inputsAreKnown
-                ? "Faults do not follow from the dump's own inputs of them; other differences are consequences.\n\n"
+                ? "Faults do not follow from the dump's own inputs of them; other differences are consequences.\n"
                 : "Faults cannot be told from consequences, as the dump lacks inputs: the first stage that differs is "
-                  "looked at.\n\n";
+                  "looked at.\n";
+        const auto agreesAllTheSame = [](const SignalCount& count) {
+            return count.faults > 0 && count.different == 0;
+        };
+        if (std::any_of(itsComparison.signals.begin(), itsComparison.signals.end(), agreesAllTheSame)) {
+            itsText += "Where faults are no differences, the core worked on right inputs: the dump has these wrong.\n";
+        }
+        itsText += '\n';
     }
 
     template <std::uint64_t SignalCount::*member>

@@ -252,6 +252,22 @@ TEST_F(Compare, AgreesWithTheTraceOfTheModel)
     }
 }
 
+TEST_F(Compare, TellsAWrongRecordFromAWrongValue)
+{
+    writeBlock(512);
+    writeDump("none", 2, 1);
+    std::string dump = morvik.read("rtl.csv");
+    const std::string place = "\n3,200,intrinsic,";
+    const std::size_t value = dump.find(place) + place.size();
+    const std::size_t end = dump.find('\n', value);
+    dump.replace(value, end - value, std::to_string(std::stoi(dump.substr(value, end - value)) + 2));
+    morvik.write("rtl.csv", dump);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "values: 1 difference\n")) << result.out;
+    EXPECT_TRUE(has(result.out, "Where faults are no differences, the core worked on right inputs")) << result.out;
+}
+
 TEST_F(Compare, FindsAFaultInAWaveform)
 {
     writeBlock(40);
