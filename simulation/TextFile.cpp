@@ -2,8 +2,10 @@
 #include "TextFile.h"
 
 #include <array>
+#include <filesystem>
 #include <fstream>
 #include <string_view>
+#include <system_error>
 
 #include "Error.h"
 #include "FileKind.h"
@@ -40,6 +42,15 @@ std::string readText(const std::string& fileName)
         text.erase(0, base::byteOrderMark.size());
     }
     return text;
+}
+
+void expectRegularFile(const std::string& fileName)
+{
+    std::error_code none;  // if there is nothing
+    if (const auto found = std::filesystem::status(fileName, none);
+        std::filesystem::exists(found) && !std::filesystem::is_regular_file(found)) {
+        throw Error(fileName + ": is no regular file");
+    }
 }
 
 }  // namespace simulation

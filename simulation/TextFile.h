@@ -13,6 +13,10 @@ constexpr std::size_t largestText = std::size_t{1} << 28;
 /// The content of a file of text, without a byte order mark. Throws Error, also when it is no text or too large.
 std::string readText(const std::string& fileName);
 
+/// Throws Error if there is something else than a regular file, to which a link may lead: a device or a pipe may have
+/// no end.
+void expectRegularFile(const std::string& fileName);
+
 }  // namespace simulation
 
 #endif

@@ -73,6 +73,24 @@ Layout::Layout(const Format& format, const Settings& settings)
     internal = settings.internal ? add(internalTable()) : 0;
 }
 
+std::set<std::string> filesOfAllTables()
+{
+    std::set<std::string> names;
+    Settings settings;
+    settings.ratios = true;
+    settings.internal = true;
+    for (const bool separate : {false, true}) {
+        settings.separateStreams = separate;
+        for (const Format& format : formats()) {
+            for (const Table& table : Layout(format, settings).tables) {
+                const std::vector<std::string> files = format.files(table);
+                names.insert(files.begin(), files.end());
+            }
+        }
+    }
+    return names;
+}
+
 BlockWriter::BlockWriter(const std::string& folder, const Format& format, const Settings& settings)
     : itsLayout(format, settings), itsIterations(settings.iterations), itsRows(itsLayout.tables.size())
 {

@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -37,6 +38,9 @@ struct Layout {
     std::size_t ratios = 0;    ///< 0 when there are none
     std::size_t internal = 0;  ///< 0 when there are none
 };
+
+/// The files of all tables that a set can have.
+std::set<std::string> filesOfAllTables();
 
 /// Writes blocks one after the other.
 class BlockWriter {

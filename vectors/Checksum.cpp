@@ -6,11 +6,13 @@
 
 #include "report/ChildProcess.h"
 #include "simulation/Error.h"
+#include "simulation/TextFile.h"
 
 namespace morvik::vectors {
 
 std::string sha256(const std::string& fileName)
 {
+    simulation::expectRegularFile(fileName);
     report::Outcome outcome{};
     try {
         outcome = report::runProgram({"sha256sum", "--", fileName}, "");

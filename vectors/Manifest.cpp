@@ -1,11 +1,16 @@
 // Manifest: manifest.json, which tells all about a set of vectors.
 #include "Manifest.h"
 
+#include <algorithm>
+#include <cmath>
+
 #include "base/Json.h"
 #include "base/Shown.h"
 #include "simulation/Error.h"
 #include "simulation/Point.h"
+#include "simulation/TextFile.h"
 #include "simulation/Thousandths.h"
+#include "standard/BlockSizes.h"
 
 namespace morvik::vectors {
 
@@ -64,15 +69,28 @@ std::vector<unsigned> blockSizesFrom(const base::JsonMembers& json)
 {
     std::vector<unsigned> sizes;
     for (const base::Json& size : json.list("block_sizes")) {
-        if (!size.is_number_unsigned() || size.get<std::uint64_t>() > UINT32_MAX) {
-            json.refuse("block_sizes", "allowed are lists of numbers of bits");
+        if (!size.is_number_unsigned() || size.get<std::uint64_t>() > UINT32_MAX ||
+            standard::findBlockSize(size.get<std::uint32_t>()) == nullptr) {
+            json.refuse("block_sizes", "allowed are lists of block sizes of 3GPP TS 36.212");
         }
         sizes.push_back(size.get<unsigned>());
     }
     return sizes;
 }
 
-/// What the check of a set needs to know. Whatever the core refuses is left to it.
+int milliDecibelsFrom(const base::JsonMembers& json)
+{
+    constexpr double most = 50;
+    const double decibels = json.number("ebn0_db");
+    const bool isInRange = decibels >= -most && decibels <= most;
+    const int thousandths = isInRange ? static_cast<int>(std::lround(1000 * decibels)) : 0;
+    if (!isInRange || simulation::fromThousandths(thousandths) != decibels) {
+        json.refuse("ebn0_db", "allowed are -50 to 50 dB, with at most three decimals");
+    }
+    return thousandths;
+}
+
+/// The settings of the set. Whatever the core refuses is left to it.
 Settings settingsOf(const base::JsonMembers& json)
 {
     Settings settings;
@@ -90,6 +108,8 @@ Settings settingsOf(const base::JsonMembers& json)
     }
     settings.blockSizes = blockSizesFrom(json);
     settings.blocks = word(json, "blocks");
+    settings.milliDecibels = milliDecibelsFrom(json);
+    settings.seed = json.integer("seed", 0, UINT64_MAX);
     settings.directed = json.flag("directed");
     settings.separateStreams = json.flag("separate_streams");
     settings.ratios = json.flag("soft");
@@ -178,8 +198,14 @@ Manifest parseManifest(const std::string& text, const std::string& fileName)
     manifest.version = members.text("version");
     manifest.command = members.text("command");
     manifest.settings = settingsOf({members.at("parameters"), fileName + ": parameters"});
-    for (const base::Json& format : members.list("formats")) {
-        manifest.formats.push_back(formatFrom(format, manifest.settings, fileName));
+    for (const base::Json& each : members.list("formats")) {
+        const ManifestFormat format = formatFrom(each, manifest.settings, fileName);
+        if (std::any_of(manifest.formats.begin(), manifest.formats.end(), [&format](const ManifestFormat& other) {
+                return other.name == format.name;
+            })) {
+            throw simulation::Error(fileName + ": names the format " + format.name + " twice");
+        }
+        manifest.formats.push_back(format);
     }
     for (const base::Json& each : members.list("blocks")) {
         const base::JsonMembers block(each, fileName + ": block " + std::to_string(manifest.blocks.size()));
@@ -193,6 +219,12 @@ Manifest parseManifest(const std::string& text, const std::string& fileName)
         throw simulation::Error(fileName + ": names no block");
     }
     return manifest;
+}
+
+Manifest readManifest(const std::string& fileName)
+{
+    simulation::expectRegularFile(fileName);
+    return parseManifest(simulation::readText(fileName), fileName);
 }
 
 }  // namespace morvik::vectors

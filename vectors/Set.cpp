@@ -11,7 +11,6 @@
 #include "SetFolder.h"
 #include "base/OutputFile.h"
 #include "simulation/Error.h"
-#include "simulation/TextFile.h"
 
 namespace morvik::vectors {
 
@@ -105,6 +104,24 @@ void expectRows(const std::string& folder, const ManifestFormat& format, const s
     }
 }
 
+/// The random blocks have to be of the sizes that the parameters tell, one size after the other.
+void expectSizes(const std::string& folder, const Manifest& manifest)
+{
+    std::size_t number = 0;
+    for (const ManifestBlock& block : manifest.blocks) {
+        if (block.name != randomName) {
+            continue;
+        }
+        const unsigned size = manifest.settings.blockSizes[number / manifest.settings.blocks];
+        if (block.K != size) {
+            throw simulation::Error(manifestIn(folder) + ": names random block " + std::to_string(number) + " of " +
+                                    std::to_string(block.K) + " bits, its parameters make it of " +
+                                    std::to_string(size));
+        }
+        ++number;
+    }
+}
+
 /// The blocks have to be as many as the parameters tell.
 void expectBlocks(const std::string& folder, const Manifest& manifest)
 {
@@ -123,25 +140,7 @@ void expectBlocks(const std::string& folder, const Manifest& manifest)
                                 (settings.directed ? "no directed block" : "directed blocks") +
                                 ", its parameters make " + (settings.directed ? "some" : "none"));
     }
-}
-
-/// The files of all tables that a set can have.
-std::set<std::string> filesOfAllTables()
-{
-    std::set<std::string> names;
-    Settings settings;
-    settings.ratios = true;
-    settings.internal = true;
-    for (const bool separate : {false, true}) {
-        settings.separateStreams = separate;
-        for (const Format& format : formats()) {
-            for (const Table& table : Layout(format, settings).tables) {
-                const std::vector<std::string> files = format.files(table);
-                names.insert(files.begin(), files.end());
-            }
-        }
-    }
-    return names;
+    expectSizes(folder, manifest);
 }
 
 /// The file of a table that the manifest does not name would be taken for one that was checked.
@@ -234,7 +233,8 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
 CheckedSet checkSet(const std::string& folder)
 {
     CheckedSet checked;
-    checked.manifest = parseManifest(simulation::readText(manifestIn(folder)), manifestIn(folder));
+    expectPlaced(folder);
+    checked.manifest = readManifest(manifestIn(folder));
     for (const ManifestFormat& format : checked.manifest.formats) {
         checked.difference = checkFormat(folder, checked.manifest, format, checked.compared);
         if (checked.difference) {

@@ -6,14 +6,14 @@
 #include <algorithm>
 #include <cstdio>
 #include <filesystem>
+#include <set>
 #include <system_error>
 #include <utility>
-#include <vector>
 
+#include "BlockFiles.h"
 #include "Manifest.h"
 #include "base/Descriptor.h"
 #include "simulation/Error.h"
-#include "simulation/TextFile.h"
 
 namespace morvik::vectors {
 
@@ -23,17 +23,44 @@ namespace fs = std::filesystem;
 
 constexpr char asideName[] = ".morvik-unfinished";
 constexpr char lockName[] = "lock";
-constexpr char earlierName[] = "earlier.json";  // the manifest of the set that is being replaced
+constexpr char earlierName[] = "earlier";     // the folder for the set that is being replaced: there while files move
+constexpr char temporaryName[] = ".morvik-";  // how files begin that have not got their names
 
 std::string pathOf(const std::string& folder, const std::string& name)
 {
     return folder + '/' + name;
 }
 
-bool exists(const std::string& path)
+/// What has the name itself: links are not followed.
+fs::file_type kindOf(const std::string& path)
 {
     std::error_code none;
-    return fs::symlink_status(path, none).type() != fs::file_type::not_found;
+    return fs::symlink_status(path, none).type();
+}
+
+bool exists(const std::string& path)
+{
+    return kindOf(path) != fs::file_type::not_found;
+}
+
+bool isFolder(const std::string& path)
+{
+    return kindOf(path) == fs::file_type::directory;
+}
+
+/// A link may lead to somebody else's.
+void expectOwnFolder(const std::string& path)
+{
+    if (exists(path) && !isFolder(path)) {
+        throw simulation::Error(path + ": is no folder, and is left alone; remove it, or choose another folder");
+    }
+}
+
+std::string asideIn(const std::string& folder)
+{
+    const std::string path = pathOf(folder, asideName);
+    expectOwnFolder(path);
+    return path;
 }
 
 void move(const std::string& from, const std::string& to)
@@ -43,15 +70,25 @@ void move(const std::string& from, const std::string& to)
     }
 }
 
-/// The names of the files in a folder, but for those that are not given.
-std::vector<std::string> namesIn(const std::string& folder, const std::vector<std::string>& but)
+/// A file, a link, or an empty folder.
+void removeOne(const std::string& path)
+{
+    if (std::remove(path.c_str()) != 0) {
+        throw simulation::fileError(path, "removed");
+    }
+}
+
+std::vector<std::string> namesIn(const std::string& folder)
 {
     std::vector<std::string> names;
-    for (const auto& entry : fs::directory_iterator(folder)) {
-        const std::string name = entry.path().filename().string();
-        if (std::find(but.begin(), but.end(), name) == but.end()) {
-            names.push_back(name);
-        }
+    std::error_code problem;
+    fs::directory_iterator entry(folder, problem);
+    while (!problem && entry != fs::directory_iterator()) {
+        names.push_back(entry->path().filename().string());
+        entry.increment(problem);
+    }
+    if (problem) {
+        throw simulation::Error(folder + ": cannot be read: " + problem.message());
     }
     return names;
 }
@@ -60,12 +97,26 @@ std::vector<std::string> namesIn(const std::string& folder, const std::vector<st
 std::vector<std::string> filesOf(const std::string& manifest)
 {
     std::vector<std::string> names;
-    for (const ManifestFormat& format : parseManifest(simulation::readText(manifest), manifest).formats) {
+    for (const ManifestFormat& format : readManifest(manifest).formats) {
         for (const ManifestFile& file : format.files) {
             names.push_back(file.name);
         }
     }
     return names;
+}
+
+/// Throws if a folder has anything that is no file of a set, nor one of the others that it may have.
+void expectSetFiles(const std::string& folder, const std::set<std::string>& others)
+{
+    std::set<std::string> known = filesOfAllTables();
+    known.insert(manifestName);
+    for (const std::string& name : namesIn(folder)) {
+        const bool isKnown = known.count(name) != 0 || name.rfind(temporaryName, 0) == 0;
+        if (others.count(name) == 0 && (!isKnown || isFolder(pathOf(folder, name)))) {
+            throw simulation::Error(pathOf(folder, name) + ": is no file of a set; " + folder +
+                                    " is for unfinished ones alone");
+        }
+    }
 }
 
 }  // namespace
@@ -74,7 +125,7 @@ SetFolder::Made::Made(std::string folder) : path(std::move(folder)), isOwn(false
 {
     std::error_code problem;
     isOwn = fs::create_directories(path, problem);
-    if (problem || !fs::is_directory(path)) {
+    if (problem || !fs::is_directory(path, problem)) {
         throw simulation::Error(path + ": cannot be made" + (problem ? ": " + problem.message() : ""));
     }
 }
@@ -88,13 +139,14 @@ SetFolder::Made::~Made()
 }
 
 SetFolder::SetFolder(std::string path)
-    : itsFolder(std::move(path)), itsAside(pathOf(itsFolder.path, asideName)), itsLock(pathOf(itsAside.path, lockName))
+    : itsFolder(std::move(path)), itsAside(asideIn(itsFolder.path)), itsLock(pathOf(itsAside.path, lockName))
 {
     if (itsLock.isTaken()) {
         throw simulation::Error(itsFolder.path +
                                 ": another process is making a set in it; wait for that to end, or "
                                 "choose another folder");
     }
+    expectOwnAside();
     itsAside.isOwn = true;
     finishEarlier();
     expectSetOrNothing();
@@ -103,8 +155,10 @@ SetFolder::SetFolder(std::string path)
 SetFolder::~SetFolder()
 {
     try {
-        clearAside();
-    } catch (const fs::filesystem_error&) {
+        if (!exists(made(earlierName))) {
+            clearAside();
+        }
+    } catch (const simulation::Error&) {
         return;  // the next one removes it
     }
 }
@@ -114,66 +168,156 @@ const std::string& SetFolder::aside() const
     return itsAside.path;
 }
 
+std::string SetFolder::placed(const std::string& name) const
+{
+    return pathOf(itsFolder.path, name);
+}
+
+std::string SetFolder::made(const std::string& name) const
+{
+    return pathOf(itsAside.path, name);
+}
+
+std::string SetFolder::earlier(const std::string& name) const
+{
+    return pathOf(made(earlierName), name);
+}
+
 void SetFolder::place()
 {
-    const std::string manifest = pathOf(itsFolder.path, manifestName);
-    const std::string earlier = pathOf(aside(), earlierName);
-    expectOwnNames();
-    if (exists(manifest) && !exists(earlier)) {
-        move(manifest, earlier);
+    expectMovable();
+    const Made holder(made(earlierName));
+    try {
+        moveAll();
+    } catch (const simulation::Error&) {
+        moveBack();
+        throw;
     }
-    if (exists(earlier)) {
-        for (const std::string& name : filesOf(earlier)) {
-            fs::remove(pathOf(itsFolder.path, name));
+    base::Descriptor(open(itsFolder.path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)).sync();
+    clearAside();
+}
+
+/// Goes on from wherever it was stopped.
+void SetFolder::moveAll() const
+{
+    const std::vector<std::string> newFiles = filesOf(made(manifestName));
+    const std::vector<std::string> oldFiles = earlierFiles();
+    if (exists(placed(manifestName))) {
+        move(placed(manifestName), earlier(manifestName));
+    }
+    for (const std::string& name : oldFiles) {
+        const bool isNew = std::find(newFiles.begin(), newFiles.end(), name) != newFiles.end() && !exists(made(name));
+        if (!isNew && exists(placed(name))) {
+            move(placed(name), earlier(name));
         }
     }
-    for (const std::string& name : namesIn(aside(), {lockName, earlierName, manifestName})) {
-        move(pathOf(aside(), name), pathOf(itsFolder.path, name));
+    for (const std::string& name : newFiles) {
+        if (exists(made(name))) {
+            move(made(name), placed(name));
+        }
     }
-    move(pathOf(aside(), manifestName), manifest);
-    base::Descriptor(open(itsFolder.path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)).sync();
+    move(made(manifestName), placed(manifestName));
+}
+
+/// Undoes as much as has been moved.
+void SetFolder::moveBack() const
+{
+    for (const std::string& name : filesOf(made(manifestName))) {
+        if (!exists(made(name))) {
+            move(placed(name), made(name));
+        }
+    }
+    std::vector<std::string> names = earlierFiles();
+    names.push_back(manifestName);
+    for (const std::string& name : names) {
+        if (exists(earlier(name)) && !isFolder(earlier(name))) {
+            move(earlier(name), placed(name));
+        }
+    }
 }
 
 /// What a process has left that was killed: a complete set is placed.
 void SetFolder::finishEarlier()
 {
-    if (exists(pathOf(aside(), manifestName))) {
+    if (exists(made(manifestName))) {
         place();
     }
     clearAside();
 }
 
+/// The manifest goes first: what has one is complete.
 void SetFolder::clearAside() const
 {
-    for (const std::string& name : namesIn(aside(), {lockName})) {
-        fs::remove_all(pathOf(aside(), name));
+    if (exists(made(manifestName))) {
+        removeOne(made(manifestName));
+    }
+    if (exists(made(earlierName))) {
+        for (const std::string& name : namesIn(made(earlierName))) {
+            removeOne(earlier(name));
+        }
+    }
+    for (const std::string& name : namesIn(aside())) {
+        if (name != lockName) {
+            removeOne(made(name));
+        }
+    }
+}
+
+void SetFolder::expectOwnAside() const
+{
+    expectSetFiles(aside(), {lockName, earlierName});
+    expectOwnFolder(made(earlierName));
+    if (exists(made(earlierName))) {
+        expectSetFiles(made(earlierName), {});
     }
 }
 
 void SetFolder::expectSetOrNothing() const
 {
-    const std::string manifest = pathOf(itsFolder.path, manifestName);
-    if (exists(manifest)) {
-        filesOf(manifest);
-    } else if (!namesIn(itsFolder.path, {asideName}).empty()) {
+    if (exists(placed(manifestName))) {
+        filesOf(placed(manifestName));
+    } else if (namesIn(itsFolder.path).size() > 1) {
         throw simulation::Error(itsFolder.path + ": is not empty and holds no " + manifestName + " of an earlier set");
     }
 }
 
-/// Throws if a file that is no set's would be overwritten.
-void SetFolder::expectOwnNames() const
+/// Throws if a file that is no set's would be overwritten, or one cannot be moved.
+void SetFolder::expectMovable() const
 {
-    const std::string manifest = pathOf(itsFolder.path, manifestName);
-    const std::string earlier = pathOf(aside(), earlierName);
-    std::vector<std::string> own;
-    if (exists(earlier) || exists(manifest)) {
-        own = filesOf(exists(earlier) ? earlier : manifest);
-    }
-    for (const std::string& name : namesIn(aside(), {lockName, earlierName, manifestName})) {
-        const std::string path = pathOf(itsFolder.path, name);
-        if (exists(path) && std::find(own.begin(), own.end(), name) == own.end()) {
-            throw simulation::Error(path + ": is no file of the earlier set, and the new one has such a file");
+    const std::vector<std::string> own = earlierFiles();
+    for (const std::string& name : own) {
+        if (isFolder(placed(name))) {
+            throw simulation::Error(placed(name) + ": is a folder, the earlier set has a file of this name");
         }
+    }
+    for (const std::string& name : filesOf(made(manifestName))) {
+        const bool isThere = exists(placed(name));
+        if (!exists(made(name)) && !(isThere && exists(made(earlierName)))) {
+            throw simulation::Error(made(name) + ": is missing, the unfinished set cannot be placed");
+        }
+        if (exists(made(name)) && isThere && std::find(own.begin(), own.end(), name) == own.end()) {
+            throw simulation::Error(placed(name) + ": is no file of the earlier set, and the new one has such a file");
+        }
+    }
+}
+
+/// The files of the set that is being replaced, wherever it is by now.
+std::vector<std::string> SetFolder::earlierFiles() const
+{
+    for (const std::string& manifest : {earlier(manifestName), placed(manifestName)}) {
+        if (exists(manifest)) {
+            return filesOf(manifest);
+        }
+    }
+    return {};
+}
+
+void expectPlaced(const std::string& folder)
+{
+    if (!exists(pathOf(folder, manifestName)) && exists(pathOf(folder, asideName) + '/' + manifestName)) {
+        throw simulation::Error(folder +
+                                ": has a set that is not placed yet; if its command was killed, the next "
+                                "'morvik vectors --out' into this folder finishes it");
     }
 }
 

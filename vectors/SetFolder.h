@@ -3,6 +3,7 @@
 #define MORVIK_VECTORS_SETFOLDER_H
 
 #include <string>
+#include <vector>
 
 #include "simulation/OwnFile.h"
 
@@ -10,9 +11,10 @@ namespace morvik::vectors {
 
 /// Files that are not of a set stay as they are. Everything throws simulation::Error.
 ///
-/// A new set is made aside, in a hidden folder within, and is moved when it is complete. The manifest goes first and
-/// comes last: without it, there is no set. A process that is killed leaves the earlier set, or, if that was while it
-/// moved the files, no set; the next one finishes what can be finished and removes the rest.
+/// A new set is made aside, in a hidden folder within. When it is complete, the files of the earlier one go aside, too,
+/// and the new ones take their place. The manifest goes first and comes last: without it, there is no set. If a step
+/// fails, the earlier ones go back. A process that is killed leaves the earlier set or the new one, or, if that was
+/// while it moved the files, none: then the next one finishes it. What else a killed one has left is removed.
 class SetFolder {
 public:
     /// Makes the folder if it is not there. Throws unless it is empty or holds an earlier set, and while another
@@ -27,8 +29,8 @@ public:
     /// Where the files of the new set are to be made, the manifest last.
     const std::string& aside() const;
 
-    /// Puts the new set in the place of the earlier one. Throws, and leaves that, if the folder has another file of the
-    /// name of a new one.
+    /// Puts the new set in the place of the earlier one. Throws, and leaves that, where something else has the name of
+    /// a file of either, or a file cannot be moved.
     void place();
 
 private:
@@ -44,14 +46,26 @@ private:
     };
 
     void finishEarlier();
+    void moveAll() const;
+    void moveBack() const;
     void clearAside() const;
+    void expectOwnAside() const;
     void expectSetOrNothing() const;
-    void expectOwnNames() const;
+    void expectMovable() const;
+    std::vector<std::string> earlierFiles() const;
+
+    /// The path of what is in the folder, aside, or aside as a file of the earlier set.
+    std::string placed(const std::string& name) const;
+    std::string made(const std::string& name) const;
+    std::string earlier(const std::string& name) const;
 
     Made itsFolder;
     Made itsAside;
     simulation::OwnFile itsLock;
 };
+
+/// Throws where a killed process has left a set that is half placed.
+void expectPlaced(const std::string& folder);
 
 }  // namespace morvik::vectors
 

@@ -276,31 +276,112 @@ TEST_F(VectorSet, IsMadeWhereAProcessWasKilled)
     EXPECT_EQ(difference(), "none");
 }
 
-TEST_F(VectorSet, IsCompleteWhereAProcessWasKilledWhileItPlacedOne)
+TEST_F(VectorSet, IsCompleteWhereverAProcessWasKilledWhileItPlacedOne)
 {
+    namespace fs = std::filesystem;
     settings.ratios = settings.internal = false;
-    settings.formats = {"memh"};
-    make();
-    std::filesystem::rename(path(), folder.path("earlier"));
     settings.formats = {"csv"};
+    const std::string aside = path() + "/.morvik-unfinished";
+    // The steps by name: one file of the earlier set after the other goes, the manifest first; then the new ones come.
+    const std::vector<std::string> order = {"manifest.json", "blocks.csv", "stimulus.csv", "expected.csv"};
+    for (std::size_t steps = 0; steps < 2 * order.size(); ++steps) {
+        fs::remove_all(path());
+        settings.blockSizes = {48};
+        make();
+        const std::string manifest = read("manifest.json");
+        fs::rename(path(), folder.path("new"));
+        settings.blockSizes = {40};
+        make();
+        fs::rename(folder.path("new"), aside);
+        fs::create_directory(aside + "/earlier");
+        for (std::size_t step = 0; step < steps; ++step) {
+            const std::string& name = order[step < order.size() ? step : step - order.size() + 1];
+            const bool isOld = step < order.size();
+            fs::rename((isOld ? path() : aside) + '/' + name, (isOld ? aside + "/earlier" : path()) + '/' + name);
+        }
+        if (steps > 0) {
+            expectRefused(path() +
+                          ": has a set that is not placed yet; if its command was killed, the next 'morvik vectors "
+                          "--out' into this folder finishes it");
+        }
+        {
+            const morvik::vectors::SetFolder next(path());
+        }
+        EXPECT_EQ(names(), ofCsv) << steps;
+        EXPECT_EQ(read("manifest.json"), manifest) << steps;
+        EXPECT_EQ(difference(), "none") << steps;
+    }
+}
+
+TEST_F(VectorSet, LeavesTheEarlierOneWhenAFileCannotBeMoved)
+{
+    settings.formats = {"csv"};
+    settings.ratios = settings.internal = false;
     make();
     const std::string manifest = read("manifest.json");
-
-    // The earlier manifest has gone aside, one of the earlier files is removed, and one of the new ones placed.
-    const std::string aside = path() + "/.morvik-unfinished";
-    std::filesystem::create_directory(aside);
-    for (const char* const file : {"manifest.json", "expected.csv", "stimulus.csv"}) {
-        std::filesystem::rename(path() + '/' + file, aside + '/' + file);
-    }
-    std::filesystem::rename(folder.path("earlier/manifest.json"), aside + "/earlier.json");
-    std::filesystem::rename(folder.path("earlier/expected.memh"), path() + "/expected.memh");
-    std::filesystem::rename(folder.path("earlier/stimulus.memh"), path() + "/stimulus.memh");
+    std::filesystem::copy(path(), folder.path("new"));
     {
-        const morvik::vectors::SetFolder next(path());
+        morvik::vectors::SetFolder set(path());
+        std::filesystem::copy(folder.path("new"), set.aside());
+        std::filesystem::create_directories(set.aside() + "/earlier/expected.csv");  // where the old one is to go
+        EXPECT_THROW(set.place(), simulation::Error);
+        EXPECT_EQ(read("manifest.json"), manifest);
+        EXPECT_EQ(difference(), "none");
+        std::filesystem::remove(set.aside() + "/earlier/expected.csv");
     }
+    make();
     EXPECT_EQ(names(), ofCsv);
+}
+
+TEST_F(VectorSet, LeavesTheEarlierOneWhereAFolderHasTheNameOfAFile)
+{
+    settings.formats = {"csv"};
+    settings.ratios = settings.internal = false;
+    make();
+    const std::string manifest = read("manifest.json");
+    std::filesystem::remove(path() + "/stimulus.csv");
+    std::filesystem::create_directory(path() + "/stimulus.csv");
+    folder.write("set/stimulus.csv/mine.txt", "x");
+    settings.blocks = 1;
+    try {
+        make();
+        FAIL() << "accepted";
+    } catch (const simulation::Error& error) {
+        EXPECT_EQ(error.what(), path() + "/stimulus.csv: is a folder, the earlier set has a file of this name");
+    }
     EXPECT_EQ(read("manifest.json"), manifest);
-    EXPECT_EQ(difference(), "none");
+    EXPECT_EQ(read("stimulus.csv/mine.txt"), "x");
+    EXPECT_EQ(names(), ofCsv);
+}
+
+TEST_F(VectorSet, LeavesAloneWhatOthersKeepWhereUnfinishedOnesAre)
+{
+    const std::string aside = path() + "/.morvik-unfinished";
+    const auto expectNotMade = [this](const std::string& message) {
+        try {
+            make();
+            FAIL() << "accepted";
+        } catch (const simulation::Error& error) {
+            EXPECT_EQ(error.what(), message);
+        }
+    };
+    std::filesystem::create_directory(path());
+    std::filesystem::create_directory(folder.path("precious"));
+    folder.write("precious/blocks.csv", "x");
+    const std::string noFolder = ": is no folder, and is left alone; remove it, or choose another folder";
+    std::filesystem::create_symlink("../precious", aside);
+    expectNotMade(aside + noFolder);
+    std::filesystem::remove(aside);
+
+    std::filesystem::create_directory(aside);
+    std::filesystem::create_symlink("../../precious", aside + "/earlier");
+    expectNotMade(aside + "/earlier" + noFolder);
+    std::filesystem::remove(aside + "/earlier");
+    EXPECT_EQ(folder.read("precious/blocks.csv"), "x");
+
+    folder.write("set/.morvik-unfinished/mine.txt", "x");
+    expectNotMade(aside + "/mine.txt: is no file of a set; " + aside + " is for unfinished ones alone");
+    EXPECT_EQ(read(".morvik-unfinished/mine.txt"), "x");
 }
 
 TEST_F(VectorSet, LeavesOtherFoldersAlone)
@@ -389,6 +470,20 @@ TEST_F(VectorSet, RefusesAFileThatIsNotTheOneWritten)
     expectRefused("sha256sum: " + path() + "/expected.npy: No such file or directory");
 }
 
+TEST_F(VectorSet, RefusesWhatHasNoEnd)
+{
+    make();
+    for (const char* const name : {"stimulus.c", "stimulus.csv", "stimulus.memh", "stimulus.npy", "manifest.json"}) {
+        const std::string file = path() + '/' + name;
+        std::filesystem::rename(file, folder.path("kept"));
+        std::filesystem::create_symlink("/dev/zero", file);
+        expectRefused(file + ": is no regular file");
+        std::filesystem::remove(file);
+        std::filesystem::rename(folder.path("kept"), file);
+    }
+    EXPECT_EQ(difference(), "none");
+}
+
 TEST_F(VectorSet, RefusesTooFewAndTooManyRows)
 {
     settings.formats = {"csv"};
@@ -444,6 +539,14 @@ TEST_F(VectorSet, RefusesAManifestThatIsNone)
         "\"tag\": 1", "\"tag\": -1", "block 1: \"tag\" is -1, allowed are the integers 0 to 4294967295");
     expectManifestRefused("\"tag\": 1", "\"tag\": 3", "has another size or tag of block 1 than csv");
     expectManifestRefused("\"block_size\": 40", "\"block_size\": 48", "has another size or tag of block 0 than csv");
+    expectManifestRefused("\"block_sizes\": \\[\\s*40\\s*\\]",
+                          "\"block_sizes\": [41]",
+                          "parameters: \"block_sizes\" is a list, allowed are lists of block sizes of 3GPP TS 36.212");
+    expectManifestRefused("\"seed\": 1,", "", "parameters: lacks \"seed\"");
+    expectManifestRefused("\"ebn0_db\": 1.0,", "", "parameters: lacks \"ebn0_db\"");
+    expectManifestRefused("\"ebn0_db\": 1.0",
+                          "\"ebn0_db\": 1.0001",
+                          "parameters: \"ebn0_db\" is 1.0001, allowed are -50 to 50 dB, with at most three decimals");
     expectManifestRefused("\"width\": 8", "\"width\": 12", "parameters: \"width\" is 12, allowed are 8 and 16");
     expectManifestRefused(
         "\"scaled\"", "\"best\"", "parameters: \"algorithm\" is \"best\", allowed are max-log, scaled, table");
@@ -513,6 +616,10 @@ TEST_F(VectorSet, RefusesToCompareLessThanTheManifestTells)
         manifest + "format csv has more tables than its parameters make");
     expectChangedRefused([](auto& json) { json["formats"][1]["tables"][3]["rows"] = 0; },
                          manifest + "tells 0 rows of ratios in memh, there are 80");
+    expectChangedRefused([](auto& json) { json["formats"][1] = json["formats"][0]; },
+                         manifest + "names the format csv twice");
+    expectChangedRefused([](auto& json) { json["parameters"]["block_sizes"][0] = 48; },
+                         manifest + "names random block 0 of 40 bits, its parameters make it of 48");
     expectChangedRefused([](auto& json) { json["parameters"]["blocks"] = 3; },
                          manifest + "names 2 random blocks, its parameters make 3");
     expectChangedRefused([](auto& json) { json["parameters"]["directed"] = true; },
