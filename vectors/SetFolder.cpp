@@ -58,7 +58,7 @@ void expectOwnFolder(const std::string& path)
 
 std::string asideIn(const std::string& folder)
 {
-    const std::string path = pathOf(folder, asideName);
+    std::string path = pathOf(folder, asideName);
     expectOwnFolder(path);
     return path;
 }
