@@ -28,15 +28,21 @@ std::string inHexadecimal(std::string_view bytes)
     return text;
 }
 
+/// Takes the first character, or a byte that is part of none, off the text. Returns it as it is shown.
+std::string takeFirst(std::string_view& text, bool keepsLines)
+{
+    const std::size_t length = lengthOfFirst(text);
+    const std::string_view first = text.substr(0, length == 0 ? 1 : length);
+    const bool isShown = length > 0 && (!isControl(text, length) || (keepsLines && text[0] == '\n'));
+    text.remove_prefix(first.size());
+    return isShown ? std::string(first) : inHexadecimal(first);
+}
+
 std::string visible(std::string_view text, bool keepsLines)
 {
     std::string result;
     while (!text.empty()) {
-        const std::size_t length = lengthOfFirst(text);
-        const std::string_view first = text.substr(0, length == 0 ? 1 : length);
-        const bool isShown = length > 0 && (!isControl(text, length) || (keepsLines && text[0] == '\n'));
-        result += isShown ? std::string(first) : inHexadecimal(first);
-        text.remove_prefix(first.size());
+        result += takeFirst(text, keepsLines);
     }
     return result;
 }
@@ -77,6 +83,19 @@ std::string visible(std::string_view text)
 std::string visibleLines(std::string_view text)
 {
     return visible(text, true);
+}
+
+std::string shortened(std::string_view text, std::size_t longest)
+{
+    std::string result;
+    while (!text.empty()) {
+        const std::string first = takeFirst(text, false);
+        if (result.size() + first.size() > longest) {
+            return result + "...";
+        }
+        result += first;
+    }
+    return result;
 }
 
 }  // namespace base

@@ -18,6 +18,9 @@ std::string visible(std::string_view text);
 /// The same of a text of several lines, whose ends stay.
 std::string visibleLines(std::string_view text);
 
+/// The visible text, of one that has more than so many bytes the start. No character and no \x1b is cut in two.
+std::string shortened(std::string_view text, std::size_t longest);
+
 }  // namespace base
 
 #endif

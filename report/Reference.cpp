@@ -12,6 +12,7 @@
 
 #include "Wording.h"
 #include "base/Csv.h"
+#include "base/Shown.h"
 #include "simulation/ResultFiles.h"
 #include "simulation/TextFile.h"
 
@@ -88,7 +89,7 @@ private:
         itsColumns = names;
         for (std::size_t i = 0; i < names.size(); ++i) {
             if (!names[i].empty() && indexOf(names[i]) != i) {
-                fail("column " + shown(names[i]) + " is there twice");
+                fail("column " + base::shown(names[i]) + " is there twice");
             }
         }
         nameAlike("fer", "bler");
@@ -207,8 +208,8 @@ private:
         }
         const auto value = parsed<double>(field);
         if (!value || !(*value >= min && *value <= max)) {
-            fail(shown(field) + " in the column " + column + " is not allowed, allowed are numbers from " + exact(min) +
-                 " to " + exact(max));
+            fail(base::shown(field) + " in the column " + column + " is not allowed, allowed are numbers from " +
+                 exact(min) + " to " + exact(max));
         }
         return *value;
     }
@@ -221,16 +222,10 @@ private:
         }
         const auto value = parsed<std::uint64_t>(field);
         if (!value || *value > max) {
-            fail(shown(field) + " in the column " + column + " is not allowed, allowed are the integers 0 to " +
+            fail(base::shown(field) + " in the column " + column + " is not allowed, allowed are the integers 0 to " +
                  std::to_string(max));
         }
         return *value;
-    }
-
-    /// A field as messages show it.
-    static std::string shown(const std::string& field)
-    {
-        return '"' + shortened(printable(field), 40) + '"';
     }
 
     /// The curves as references, named after the file, too.

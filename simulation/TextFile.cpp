@@ -19,24 +19,29 @@ std::string readText(const std::string& fileName)
     if (!file) {
         throw fileError(fileName, "opened");
     }
+    return readText(file, fileName, largestText);
+}
+
+std::string readText(std::istream& file, const std::string& name, std::size_t largest)
+{
     std::string text;
     std::array<char, 65536> part = {};
     while (file.read(part.data(), part.size()) || file.gcount() > 0) {
         const std::string_view next(part.data(), static_cast<std::size_t>(file.gcount()));
         const char* const reason = text.empty() ? whyNoText(next) : nullptr;
         if (reason != nullptr) {
-            throw Error(fileName + ": " + reason);
+            throw Error(name + ": " + reason);
         }
         if (next.find('\0') != std::string_view::npos) {
-            throw Error(fileName + ": is no text, it has a null character");
+            throw Error(name + ": is no text, it has a null character");
         }
-        if (text.size() + next.size() > largestText) {
-            throw Error(fileName + ": is too large, allowed are " + std::to_string(largestText) + " bytes");
+        if (text.size() + next.size() > largest) {
+            throw Error(name + ": is too large, allowed are " + std::to_string(largest) + " bytes");
         }
         text += next;
     }
     if (file.bad()) {
-        throw fileError(fileName, "read");
+        throw fileError(name, "read");
     }
     if (text.compare(0, base::byteOrderMark.size(), base::byteOrderMark) == 0) {
         text.erase(0, base::byteOrderMark.size());

@@ -3,6 +3,7 @@
 #define MORVIK_SIMULATION_TEXTFILE_H
 
 #include <cstddef>
+#include <istream>
 #include <string>
 
 namespace simulation {
@@ -16,6 +17,9 @@ std::string readText(const std::string& fileName);
 /// Throws Error if there is something else than a regular file, to which a link may lead: a device or a pipe may have
 /// no end.
 void expectRegularFile(const std::string& fileName);
+
+/// What readText(fileName) gives of an open file, which messages call `name`, of at most so many bytes.
+std::string readText(std::istream& file, const std::string& name, std::size_t largest);
 
 }  // namespace simulation
 

@@ -80,7 +80,7 @@ TEST(Json, OfMoreThanItsLimitsIsRefused)
 TEST(Json, IsShortInMessages)
 {
     EXPECT_EQ(base::shownValue(Json(std::string(1000, 'x'))), '"' + std::string(40, 'x') + "...\"");
-    EXPECT_EQ(base::shownValue(Json("a\nb")), "\"a?b\"");
+    EXPECT_EQ(base::shownValue(Json("a\nb")), "\"a\\x0ab\"");
     EXPECT_EQ(base::shownValue(Json::array({1, 2})), "a list");
     EXPECT_EQ(base::shownValue(Json::object()), "an object");
     EXPECT_EQ(base::shownValue(Json(1.5)), "1.5");

@@ -41,4 +41,13 @@ TEST(Printable, KeepsLinesWhereThereAreSome)
     EXPECT_EQ(visibleLines("one\ntwo\r\n"), "one\ntwo\\x0d\n");
 }
 
+TEST(Printable, IsCutBetweenCharacters)
+{
+    EXPECT_EQ(base::shortened("abcd", 4), "abcd");
+    EXPECT_EQ(base::shortened("abcde", 4), "abcd...");
+    EXPECT_EQ(base::shortened("a\x1b", 4), "a...");
+    EXPECT_EQ(base::shortened("a\x1b", 5), "a\\x1b");
+    EXPECT_EQ(base::shortened("abc\u00e9", 4), "abc...");
+}
+
 }  // namespace

@@ -216,8 +216,8 @@ TEST_F(Reference, RefusesValuesThatAreNone)
     expectRefused(header + "0,-0.1,1\n", ":2: \"-0.1\"" + rates);
     expectRefused(header + "0,nan,1\n", ":2: \"nan\"" + rates);
     expectRefused(header + "0,0.1x,1\n", ":2: \"0.1x\"" + rates);
-    expectRefused(header + "0,\x1b[31m\xff,1\n", ":2: \" [31m?\"" + rates);
-    expectRefused(header + "0," + std::string(50, '9') + ",1\n", ":2: \"" + std::string(39, '9') + "\u2026\"" + rates);
+    expectRefused(header + "0,\x1b[31m\xff,1\n", ":2: \"\\x1b[31m\\xff\"" + rates);
+    expectRefused(header + "0," + std::string(50, '9') + ",1\n", ":2: \"" + std::string(40, '9') + "...\"" + rates);
     expectRefused(header + "0,0.1,-1\n", ":2: \"-1\"" + counts);
     expectRefused(header + "0,0.1,1.5\n", ":2: \"1.5\"" + counts);
     expectRefused(header + "0,0.1,18446744073709551616\n", ":2: \"18446744073709551616\"" + counts);

@@ -174,7 +174,7 @@ TEST(Plan, TellsWhatKeepsARunFromGoingOn)
     EXPECT_EQ(obstaclesBetween("morvik ber --each-iteration --seed 1", "morvik ber --seed 2 --frames 0:5"),
               "--each-iteration, --seed 1 instead of 2, without --frames");
     const std::string hostile = obstaclesBetween("morvik ber --\x1b[31m" + std::string(100000, 'x'), "morvik ber");
-    EXPECT_EQ(hostile.substr(0, 8), "--?[31mx");
+    EXPECT_EQ(hostile.substr(0, 11), "--\\x1b[31mx");
     EXPECT_LT(hostile.size(), 100U);
 }
 

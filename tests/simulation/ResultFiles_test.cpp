@@ -147,7 +147,7 @@ TEST_F(ResultFiles, CanHaveLinesThatEndInCarriageReturns)
 TEST_F(ResultFiles, AreShownInPrintableTextWhereTheyAreWrong)
 {
     EXPECT_EQ(refusal("a.csv", csvWith(",scaled,", ",\x1b[31mscaled,")),
-              "a.csv:2: algorithm \"?[31mscaled\" is not allowed");
+              "a.csv:2: algorithm \"\\x1b[31mscaled\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",0:40,", ',' + std::string(1000, '1') + ',')),
               "a.csv:2: frames \"" + std::string(40, '1') + "...\" is not allowed");
 }
