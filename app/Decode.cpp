@@ -163,7 +163,9 @@ int decode(const Options& options)
         referenceFile.emplace(*options.reference);
         reference.emplace(referenceFile->stream(), referenceFile->name());
     }
-    base::expectOwnFile(options.output, {options.input, options.reference.value_or(options.input)}, "the decisions");
+    const std::vector<std::string> inputs = {options.input, options.reference.value_or(options.input)};
+    base::expectOwnFile(options.output, inputs, "the decisions");
+    base::expectOwnFile(standardStream, inputs, "the decoder's messages");
     base::OutputFile output(options.output);
     Summary summary;
     decodeBlocks(options, reader, reference, output, summary);

@@ -1,12 +1,14 @@
 // Vectors: the subcommand that makes stimulus and expected values for a test bench.
 #include "Vectors.h"
 
+#include <filesystem>
 #include <memory>
 #include <string>
 #include <vector>
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
+#include "Files.h"
 #include "Lists.h"
 #include "Notice.h"
 #include "base/Printable.h"
@@ -95,9 +97,23 @@ int make(const Options& options)
     return success;
 }
 
+/// All that is read when the set is checked.
+std::vector<std::string> filesOf(const std::string& path, const vectors::Manifest& manifest)
+{
+    const std::filesystem::path folder = path;
+    std::vector<std::string> files = {folder / vectors::manifestName};
+    for (const vectors::ManifestFormat& format : manifest.formats) {
+        for (const vectors::ManifestFile& file : format.files) {
+            files.push_back(folder / file.name);
+        }
+    }
+    return files;
+}
+
 int check(const std::string& path)
 {
     const vectors::CheckedSet set = vectors::checkSet(path);
+    base::expectOwnFile(standardStream, filesOf(path, set.manifest), "findings");
     const std::string opening =
         coreLine(set.manifest.settings.generics, set.manifest.settings.iterations) + base::visible(path) + ": ";
     if (set.difference) {

@@ -83,7 +83,7 @@ Pictures::Pictures(const PictureOptions& options, const std::string& output, std
     : itsOptions(options)
 {
     inputs.insert(inputs.end(), options.references.begin(), options.references.end());
-    for (const std::string& file : {output, options.plot, options.report}) {
+    for (const std::string& file : {output, options.plot, options.report, std::string(base::standardStream)}) {
         base::expectOwnFile(file, inputs, "results");
     }
     for (const std::string& file : options.references) {

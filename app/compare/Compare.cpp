@@ -56,6 +56,7 @@ bool isVcd(const Options& options)
 
 int compare(const Options& options)
 {
+    base::expectOwnFile(standardStream, {options.block, options.dump, options.map}, "reports");
     const ComparedRun run = {
         options.block, options.number, readBlock(options.block, options.number), options.decoder.generics};
     const comparison::NameMap map = readMap(options.map);

@@ -71,6 +71,7 @@ Cases readCases(const Options& options)
 
 int examine(const Options& options)
 {
+    base::expectOwnFile(standardStream, {options.input, options.reference}, "findings");
     const Cases read = readCases(options);
     doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
     diagnosis.hasMore = read.hasMore;

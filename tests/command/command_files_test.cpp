@@ -143,7 +143,7 @@ TEST_F(CommandFiles, RefusesAnotherHeader)
     expectRefused("a,b,c,d\n", "in.csv:1: wrong header \"a,b,c,d\"" + expected);
     expectRefused(zeroRows("0", 44), "in.csv:1: wrong header \"0,-64,-64,-64\"" + expected);
     expectRefused("\n" + twoBlocks(), "in.csv:1: wrong header \"\"" + expected);
-    expectRefused("\x7f\x45\x4c\x46\x02\n", "in.csv:1: wrong header \"?ELF?\"" + expected);
+    expectRefused("\x7f\x45\x4c\x46\x02\n", "in.csv:1: wrong header \"\\x7fELF\\x02\"" + expected);
     expectRefused(std::string(50, 'x') + '\n', "in.csv:1: wrong header \"" + std::string(40, 'x') + "...\"" + expected);
 }
 
@@ -365,6 +365,41 @@ TEST_F(CommandFiles, NeverOverwritesWhatItReadsUnderAnotherName)
     EXPECT_EQ(appended.status, 2);
     EXPECT_EQ(appended.err, "morvik decode: <stdout>: is read as in.csv, the decisions need a file of their own\n");
     EXPECT_EQ(morvik.read("in.csv"), twoBlocks());
+}
+
+TEST_F(CommandFiles, NeverPrintsIntoWhatItReads)
+{
+    const std::string dump = "half_iteration,step,signal,value\n0,0,llr,5\n";
+    morvik.write("in.csv", twoBlocks());
+    morvik.write("dump.csv", dump);
+    morvik.write("map.json", "{}");
+    morvik.write("ref.bits", zeroDecision + zeroDecision);
+    ASSERT_EQ(shell("\"$0\" ber --block-size 40 --ebn0 5 --frames 0:4 --output a.csv >/dev/null").status, 0);
+    ASSERT_EQ(shell("\"$0\" vectors --out set --block-size 40 --blocks 1 --no-directed >/dev/null").status, 0);
+    const std::string compare = "compare --block in.csv --dump dump.csv --map map.json";
+    const std::string doctor = "doctor in.csv --reference ref.bits";
+    for (const auto& [arguments, file] : std::vector<std::pair<std::string, std::string>>{
+             {compare, "in.csv"},
+             {compare, "dump.csv"},
+             {compare, "map.json"},
+             {doctor, "in.csv"},
+             {doctor, "ref.bits"},
+             {"decode in.csv --output out.bits --trace 1", "in.csv"},
+             {"decode in.csv --output out.bits --reference ref.bits", "ref.bits"},
+             {"merge a.csv", "a.csv"},
+             {"merge a.csv --plot a.svg --reference a.csv", "a.csv"},
+             {"vectors --check set", "set/manifest.json"}}) {
+        const std::string before = morvik.read(file);
+        for (const std::string printedTo : {" >>", " 1<>"}) {
+            const std::string script = "\"$0\" " + arguments + printedTo + file;
+            const CommandResult result = shell(script);
+            EXPECT_EQ(result.status, 2) << script;
+            const std::string expected = ": <stdout>: is read as " + file;
+            EXPECT_NE(result.err.find(expected), std::string::npos) << script << '\n' << result.err;
+            EXPECT_TRUE(morvik.read(file) == before) << script;
+        }
+    }
+    EXPECT_EQ(shell("\"$0\" " + doctor + " <in.csv >found.txt").status, 0);
 }
 
 TEST_F(CommandFiles, NeverPrintsIntoAFileInThePlaceOfAClosedStream)
