@@ -1,6 +1,8 @@
 // CsvDump: dumps as comma-separated values.
 #include <algorithm>
+#include <functional>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -37,12 +39,15 @@ bool isUnknown(std::string_view text, NumberForm form)
 class CsvReader {
 public:
     CsvReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
-        : itsFile(input, name), itsMap(map), itsDump(dump)
+        : itsFile(input, name), itsMap(map), itsDump(dump), itsLacking(map.needed)
     {
     }
 
     void read()
     {
+        if (!itsMap.valid.empty()) {
+            itsFile.failAsAWhole("is CSV, of which all rows count; \"valid\" in a map is for VCD");
+        }
         if (!itsFile.next()) {
             itsFile.fail("no header, expected the columns half_iteration, step, signal, value");
         }
@@ -52,6 +57,7 @@ public:
             itsRow = base::fieldsOf(itsFile.line());
             readRow();
         }
+        itsFile.expectNoneLacking(itsLacking, itsMap);
     }
 
 private:
@@ -67,12 +73,13 @@ private:
         itsStep = needColumn(itsMap.stepColumn);
         itsFields = itsRow.size();
         itsSignal = findColumn(itsRow, itsMap.signalColumn);
-        if (itsSignal) {
+        if (itsSignal || itsMap.namesRows) {
+            itsSignal = needColumn(itsMap.signalColumn);
             itsValue = needColumn(itsMap.valueColumn);
             return;
         }
         for (std::size_t i = 0; i < itsFields; ++i) {
-            const auto signal = itsMap.signal(itsRow[i]);
+            const auto signal = signalOf(itsRow[i]);
             if (signal && *signal != NameMap::leftOut) {
                 addColumn(std::string(itsRow[i]), *signal, i);
             }
@@ -80,6 +87,15 @@ private:
         if (itsColumns.empty()) {
             needColumn(itsMap.signalColumn);
         }
+    }
+
+    std::optional<unsigned> signalOf(std::string_view name)
+    {
+        const auto found = itsLacking.find(name);
+        if (found != itsLacking.end()) {
+            itsLacking.erase(found);
+        }
+        return itsMap.signal(name);
     }
 
     void addColumn(const std::string& name, unsigned signal, std::size_t column)
@@ -116,7 +132,7 @@ private:
             return;
         }
         const std::string_view name = itsRow[*itsSignal];
-        const auto signal = itsMap.signal(name);
+        const auto signal = signalOf(name);
         if (!signal) {
             itsFile.fail("signal " + shown(name) + " is not known; a map tells which it is, or that it does not count");
         }
@@ -154,7 +170,8 @@ private:
     DumpFile itsFile;
     const NameMap& itsMap;
     Dump& itsDump;
-    Fields itsRow;  // of the line
+    std::set<std::string, std::less<>> itsLacking;  // of the names that the map needs
+    Fields itsRow;                                  // of the line
     std::size_t itsPass = 0;
     std::size_t itsStep = 0;
     std::size_t itsFields = 0;

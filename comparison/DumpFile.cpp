@@ -11,6 +11,20 @@
 
 namespace morvik::comparison {
 
+void DumpFile::failAsAWhole(const std::string& what) const
+{
+    throw simulation::Error(name() + ": " + what);
+}
+
+void DumpFile::expectNoneLacking(const std::set<std::string, std::less<>>& names, const NameMap& map) const
+{
+    if (!names.empty()) {
+        const std::string& first = *names.begin();
+        failAsAWhole("has no signal " + simulation::shown(first) + ", which the map calls " +
+                     passSignals[*map.signal(first)]);
+    }
+}
+
 bool DumpFile::nextFilled()
 {
     constexpr unsigned most = 1000000;

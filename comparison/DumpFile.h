@@ -3,6 +3,8 @@
 #define MORVIK_COMPARISON_DUMPFILE_H
 
 #include <cstdint>
+#include <functional>
+#include <set>
 #include <string>
 #include <string_view>
 
@@ -14,6 +16,12 @@ namespace morvik::comparison {
 class DumpFile : public LineFile {
 public:
     using LineFile::LineFile;
+
+    /// What is wrong with the dump as a whole.
+    [[noreturn]] void failAsAWhole(const std::string& what) const;
+
+    /// The names are those of signals in the map that the dump lacks: throws if there is one.
+    void expectNoneLacking(const std::set<std::string, std::less<>>& names, const NameMap& map) const;
 
     /// Goes to the next line that has more than blanks; false at the end.
     bool nextFilled();

@@ -12,6 +12,7 @@
 #include "base/Json.h"
 #include "base/Shown.h"
 #include "simulation/Error.h"
+#include "simulation/TextFile.h"
 
 namespace morvik::comparison {
 
@@ -96,6 +97,9 @@ private:
             map.firstStep = count(key, value, 0, 1);
         } else if (key == "valid") {
             map.valid = text(key, value);
+            if (map.valid.empty()) {
+                fail("\"valid\" is empty");
+            }
         } else {
             fail(shown(key) +
                  " is no key of a map, allowed are columns, signals, numbers, bits, first_half_iteration, first_step, "
@@ -171,6 +175,9 @@ private:
                      ", and null");
             }
             map.signals[theirs] = signal.value_or(NameMap::leftOut);
+            if (signal) {
+                map.needed.insert(theirs);
+            }
         }
     }
 
@@ -183,6 +190,7 @@ private:
                  "g1 and g2");
         }
         map.signals[theirs] = *signal;
+        map.needed.insert(theirs);
         map.standIns[twinOf(*signal)] = theirs;
     }
 
@@ -201,6 +209,7 @@ private:
                 fail("column " + shown(key) + ", allowed are half_iteration, step, signal, value");
             }
             *column = text(key, theirs);
+            map.namesRows = map.namesRows || key == "signal" || key == "value";
         }
     }
 
@@ -274,14 +283,8 @@ std::string NameMap::expectedNumber(unsigned signal) const
 
 NameMap readNameMap(std::istream& input, const std::string& name)
 {
-    std::string text;
-    for (std::string line; std::getline(input, line);) {
-        text += line + '\n';
-    }
-    if (input.bad()) {
-        throw simulation::fileError(name, "read");
-    }
-    const Json object = base::parseJson(text, name);
+    constexpr std::size_t largest = std::size_t{1} << 20;  // more than a map needs for every net of a core
+    const Json object = base::parseJson(simulation::readText(input, name, largest), name);
     if (!object.is_object()) {
         throw simulation::Error(name + ": no map, expected a JSON object");
     }

@@ -7,6 +7,7 @@
 #include <istream>
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <string_view>
 
@@ -25,7 +26,8 @@ enum class NumberForm : std::uint8_t {
 };
 
 /// Read from a JSON object, whose keys may all be left out:
-///   "columns"   of CSV, or variables of VCD: {"half_iteration": NAME, "step": NAME, "signal": NAME, "value": NAME}
+///   "columns"   of CSV, or, the first two, variables of VCD: {"half_iteration": NAME, "step": NAME, "signal": NAME,
+///               "value": NAME}
 ///   "signals"   {NAME: SIGNAL or null, ...}: SIGNAL is one of passSignals, or a list of two that are always equal;
 ///               null leaves the signal out
 ///   "numbers"   auto, integer, unsigned, real, hex or binary
@@ -41,6 +43,8 @@ struct NameMap {
     std::string signalColumn = "signal";
     std::string valueColumn = "value";
     std::map<std::string, unsigned, std::less<>> signals;  ///< to places in passSignals, or leftOut
+    std::set<std::string, std::less<>> needed;             ///< names of signals that a dump has to have
+    bool namesRows = false;                                ///< whether it names the column of signals or of values
     std::array<std::string, passSignals.size()> standIns;  ///< names that stand for these signals, too
     NumberForm numbers = NumberForm::automatic;
     std::array<unsigned, passSignals.size()> bits;

@@ -54,6 +54,9 @@ public:
 
     void read()
     {
+        if (itsMap.namesRows) {
+            itsFile.failAsAWhole("is VCD; the columns \"signal\" and \"value\" in a map are for CSV");
+        }
         while (nextWord()) {
             if (itsWord[0] == '$') {
                 readCommand();
@@ -74,8 +77,14 @@ private:
     /// More than a design has: a dump with more has no end.
     static constexpr unsigned mostNets = 1U << 23;
 
+    /// Words without a variable or a change of one, as of comments and of times at which nothing changes.
+    static constexpr unsigned mostIdle = 4000000;
+
     bool nextWord()
     {
+        if (++itsIdle > mostIdle) {
+            itsFile.fail("more than " + std::to_string(mostIdle) + " words without a change of a value");
+        }
         while (true) {
             itsRest.remove_prefix(std::min(itsRest.find_first_not_of(" \t"), itsRest.size()));
             if (!itsRest.empty()) {
@@ -182,6 +191,7 @@ private:
 
     void readVariable()
     {
+        itsIdle = 0;
         VcdVariable variable;
         expectWord("the kind of a variable");
         const std::string width = expectWord("the width of a variable");
@@ -219,6 +229,7 @@ private:
             return;
         }
         itsIsDeclared = true;
+        itsFile.expectNoneLacking(itsScopes.lacking(), itsMap);
         placed([this] { itsScopes.choose(); });
         const auto& scopes = itsScopes.scopes();
         itsDependents.resize(itsScopes.variables().size());
@@ -250,6 +261,7 @@ private:
 
     void readChange()
     {
+        itsIdle = 0;
         endDeclarations();
         std::string_view digits = itsWord;
         std::string_view identifier;
@@ -396,6 +408,7 @@ private:
     VcdScopes itsScopes;
     std::string_view itsRest;
     std::string_view itsWord;
+    unsigned itsIdle = 0;  // words since the last variable or change
     Timescale itsTimescale;
     std::uint64_t itsTime = 0;  // in the timescale's unit
     bool itsIsDeclared = false;

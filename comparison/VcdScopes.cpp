@@ -7,12 +7,13 @@
 #include <tuple>
 
 #include "Values.h"
+#include "base/Printable.h"
 #include "simulation/Error.h"
 #include "simulation/Shown.h"
 
 namespace morvik::comparison {
 
-VcdScopes::VcdScopes(const NameMap& map) : itsMap(map)
+VcdScopes::VcdScopes(const NameMap& map) : itsMap(map), itsLacking(map.needed)
 {
     itsLongestName = std::max({map.passColumn.size(), map.stepColumn.size(), map.valid.size()});
     for (const auto& [name, signal] : map.signals) {
@@ -61,13 +62,14 @@ void VcdScopes::forEachName(const VcdVariable& variable, Use use) const
 }
 
 /// What the longest name that the map has says of the variable.
-void VcdScopes::findSignal(VcdVariable& variable, bool& found) const
+void VcdScopes::findSignal(VcdVariable& variable, bool& found)
 {
     std::optional<unsigned> signal;
     forEachName(variable, [&](const std::string& name, bool hasScopes) {
         const auto known = itsMap.signal(name);
         if (known) {
             signal = known;
+            itsLacking.erase(name);
             variable.byPath = hasScopes;
         }
     });
@@ -230,10 +232,13 @@ void VcdScopes::expectOneOfEachPlace(const std::vector<unsigned>& candidates) co
 void VcdScopes::expectPlaces(const VcdVariable& variable) const
 {
     const VcdScope& scope = itsScopes[variable.scope];
-    if (scope.pass == nobody || scope.step == nobody) {
-        throw simulation::Error("no variable " +
-                                simulation::shown(scope.pass == nobody ? itsMap.passColumn : itsMap.stepColumn) +
-                                " in the scope of \"" + pathOf(variable) + "\" or around it");
+    const bool lacksValid = scope.valid == nobody && !itsMap.valid.empty();
+    if (scope.pass == nobody || scope.step == nobody || lacksValid) {
+        const std::string& name = scope.pass == nobody   ? itsMap.passColumn
+                                  : scope.step == nobody ? itsMap.stepColumn
+                                                         : itsMap.valid;
+        throw simulation::Error("no variable " + simulation::shown(name) + " in the scope of \"" + pathOf(variable) +
+                                "\" or around it");
     }
 }
 
@@ -249,9 +254,8 @@ std::string VcdScopes::pathOf(const VcdVariable& variable) const
     for (unsigned scope = variable.scope; scope != nobody && path.size() <= longest; scope = itsScopes[scope].parent) {
         path.insert(0, itsScopes[scope].name + '.');
     }
-    std::replace_if(
-        path.begin(), path.end(), [](char c) { return c < ' ' || c > '~'; }, '?');
-    return path.size() <= longest ? path : "..." + path.substr(path.size() - longest);
+    return path.size() <= longest ? base::visible(path)
+                                  : "..." + base::visible(std::string_view(path).substr(path.size() - longest));
 }
 
 void failAboutTwo(const VcdScopes& scopes, const VcdVariable& one, const VcdVariable& other)

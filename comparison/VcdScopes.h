@@ -4,8 +4,10 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <utility>
 #include <vector>
@@ -76,7 +78,13 @@ public:
         return itsVariables;
     }
 
-    /// "tb.dut.llr", what does not print replaced; of very long ones, the end.
+    /// The names that the map needs and no variable has.
+    const std::set<std::string, std::less<>>& lacking() const
+    {
+        return itsLacking;
+    }
+
+    /// "tb.dut.llr", as a terminal may get it; of very long ones, the end.
     std::string pathOf(const VcdVariable& variable) const;
 
     /// What the map has decided: "llr is tb.dut.llr, not tb.llr".
@@ -88,7 +96,7 @@ public:
 private:
     template <class Use>
     void forEachName(const VcdVariable& variable, Use use) const;
-    void findSignal(VcdVariable& variable, bool& found) const;
+    void findSignal(VcdVariable& variable, bool& found);
     bool isCalled(const VcdVariable& variable, const std::string& name) const;
     void setRole(unsigned& member, unsigned number) const;
 
@@ -101,6 +109,7 @@ private:
     unsigned netOf(unsigned variable) const;
 
     const NameMap& itsMap;
+    std::set<std::string, std::less<>> itsLacking;
     std::size_t itsLongestName = 0;  // that the map has
     std::vector<VcdScope> itsScopes;
     std::map<std::pair<unsigned, std::string>, unsigned> itsScopeNumbers;  // by parent and name

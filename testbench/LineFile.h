@@ -38,6 +38,11 @@ public:
         return itsNumber;
     }
 
+    const std::string& name() const
+    {
+        return itsName;
+    }
+
     /// NAME:LINE, of a file without lines that of the first.
     std::string place() const;
 

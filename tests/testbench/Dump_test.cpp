@@ -250,10 +250,38 @@ TEST(CsvDump, HasABranchMetricStandForItsTwin)
                   mapOf(R"({"signals": {"bm": ["g0", "g3"]}})"));
 }
 
+TEST(CsvDump, RefusesAMapOfWhatItLacks)
+{
+    const std::string text = header + "0,0,llr,5\n";
+    expectRefused(readCsv,
+                  text,
+                  "dump: is CSV, of which all rows count; \"valid\" in a map is for VCD",
+                  mapOf(R"({"valid": "ok"})"));
+    const std::string columns = "half_iteration,step,llr,ratio\n";
+    const std::string lacking = "dump: has no signal \"ratios\", which the map calls extrinsic";
+    const NameMap misspelt = mapOf(R"({"signals": {"ratios": "extrinsic", "clk": null}})");
+    expectRefused(readCsv, text, lacking, misspelt);
+    expectRefused(readCsv, columns + "0,0,5,6\n", lacking, misspelt);
+    expectRefused(readCsv,
+                  columns + "0,0,5,6\n",
+                  "dump:1: no column \"net\" in the header \"half_iteration,step,llr,ratio\"",
+                  mapOf(R"({"columns": {"signal": "net"}})"));
+    EXPECT_TRUE(
+        read(readCsv, columns + "0,0,5,6\n", mapOf(R"({"signals": {"ratio": "extrinsic"}})")).values.has({0, llr, 0}));
+}
+
+TEST(NameMap, HasAnEndAndIsText)
+{
+    expectMapRefused(std::string((1U << 20) + 1, ' '), "map.json: is too large, allowed are 1048576 bytes");
+    expectMapRefused(std::string(100000, '\0'), "map.json: is no text, it has a null character");
+    expectMapRefused("\x1f\x8b{}", "map.json: is compressed by gzip; 'gunzip FILE' unpacks it");
+    EXPECT_EQ(mapOf("\xEF\xBB\xBF{\"first_step\": 1}\r\n" + std::string(1000000, ' ')).firstStep, 1U);
+}
+
 TEST(NameMap, NamesWhatIsWrong)
 {
     expectMapRefused("[]", "map.json: no map, expected a JSON object");
-    expectMapRefused("{", "map.json:2: no JSON, character 1 is not expected there");
+    expectMapRefused("{", "map.json:1: no JSON, character 2 is not expected there");
     expectMapRefused("{\"bits\": 16,\n \"valid\" \"on\"}", "map.json:2: no JSON, character 13 is not expected there");
     expectMapRefused(R"({"signals": )" + std::string(100000, '[') + '}',
                      "map.json:1: character 44 opens more than 32 levels of lists and objects");
@@ -279,6 +307,7 @@ TEST(NameMap, NamesWhatIsWrong)
     expectMapRefused(R"({"columns": {"step": 1}})", "map.json: \"step\" is no text");
     expectMapRefused(R"({"numbers": "octal"})",
                      "map.json: \"numbers\" is \"octal\", allowed are auto, integer, unsigned, real, hex, binary");
+    expectMapRefused(R"({"valid": ""})", "map.json: \"valid\" is empty");
     expectMapRefused(R"({"bits": 64})", "map.json: \"bits\" is 64, allowed are the integers 8 to 32");
     expectMapRefused(R"({"bits": {"g0": 7}})", "map.json: \"g0\" is 7, allowed are the integers 8 to 32");
     expectMapRefused(R"({"bits": {"g": 8}})",
@@ -340,9 +369,45 @@ TEST(VcdDump, ReadsTheValuesOfEachScope)
 
 TEST(VcdDump, CountsOnlyWhatIsValid)
 {
-    const Dump dump = read(readVcd, vcd, mapOf(R"({"valid": "clk"})"));
+    const std::string last = "$var wire 12 m llr [11:0] $end\n";
+    std::string text = vcd;
+    text.insert(text.find(last) + last.size(), "$var wire 1 c clk $end\n");
+    const Dump dump = read(readVcd, text, mapOf(R"({"valid": "clk"})"));
     EXPECT_FALSE(dump.values.has({0, llr, 0}));
     EXPECT_EQ(dump.values.at({0, llr, 1}), 5);
+    const std::string path = "$var wire 1 c ok $end\n$scope module unit0 $end\n";
+    text = vcd;
+    text.replace(text.find("$scope module unit0 $end\n"), 25, path);
+    EXPECT_FALSE(read(readVcd, text, mapOf(R"({"valid": "core.ok"})")).values.has({0, llr, 0}));
+}
+
+TEST(VcdDump, RefusesAMapOfWhatItLacks)
+{
+    const auto lacking = [](const std::string& name, const std::string& path) {
+        return "dump:19: no variable \"" + name + "\" in the scope of \"" + path + "\" or around it";
+    };
+    expectRefused(readVcd, vcd, lacking("Clk", "core.unit0.llr"), mapOf(R"({"valid": "Clk"})"));
+    expectRefused(readVcd, vcd, lacking("tb.clk", "core.unit0.llr"), mapOf(R"({"valid": "tb.clk"})"));
+    expectRefused(readVcd, vcd, lacking("clk", "core.unit1.llr"), mapOf(R"({"valid": "clk"})"));
+    expectRefused(readVcd,
+                  vcd,
+                  "dump: has no signal \"core.unit2.llr\", which the map calls llr",
+                  mapOf(R"({"signals": {"core.unit2.llr": "llr", "clk": null, "data": null}})"));
+    expectRefused(readVcd,
+                  vcd,
+                  "dump: is VCD; the columns \"signal\" and \"value\" in a map are for CSV",
+                  mapOf(R"({"columns": {"signal": "llr"}})"));
+    EXPECT_TRUE(
+        read(readVcd, vcd, mapOf(R"({"signals": {"llr": "llr", "unit1.llr": "llr"}})")).values.has({1, llr, 40}));
+}
+
+TEST(VcdDump, RefusesTimesWithoutAnEnd)
+{
+    std::string times;
+    for (unsigned i = 0; i < 4000000; ++i) {
+        times += "#5\n";
+    }
+    expectRefused(readVcd, vcd + times, "dump:4000034: more than 4000000 words without a change of a value");
 }
 
 TEST(VcdDump, ComesBackToAScope)
