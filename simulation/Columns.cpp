@@ -172,12 +172,11 @@ const std::vector<Column> allColumns = {
 
 }  // namespace
 
-bool isVersion(std::string_view version)
+bool isVersion(std::string_view text)
 {
     constexpr std::size_t longest = 64;
-    return !version.empty() && version.size() <= longest && std::all_of(version.begin(), version.end(), [](char c) {
-        return c > ' ' && c <= '~' && c != ',' && c != '"';
-    });
+    return !text.empty() && text.size() <= longest &&
+           std::all_of(text.begin(), text.end(), [](char c) { return c > ' ' && c <= '~' && c != ',' && c != '"'; });
 }
 
 const std::vector<Column>& columns()

@@ -68,10 +68,11 @@ bool FrameSet::join(const FrameSet& other)
     std::vector<FrameRange> all = itsRanges;
     all.insert(all.end(), other.itsRanges.begin(), other.itsRanges.end());
     auto joined = joinedRanges(std::move(all));
-    if (joined) {
-        itsRanges = *std::move(joined);
+    if (!joined) {
+        return false;
     }
-    return joined.has_value();
+    itsRanges = std::move(*joined);
+    return true;
 }
 
 bool FrameSet::has(std::uint64_t frame) const
