@@ -168,6 +168,7 @@ bool isSimulated(const Variant& variant, const Options& options)
 std::vector<std::string> variantNames()
 {
     std::vector<std::string> names;
+    names.reserve(variants.size());
     for (const Variant& variant : variants) {
         names.emplace_back(variant.name);
     }
@@ -209,6 +210,7 @@ void simulatePoint(const Options& options, int milliDecibels)
     const std::vector<std::size_t> simulated = simulatedVariants(options);
     const std::vector<std::size_t> predecessors = predecessorsOf(simulated);
     std::vector<VariantDecoder> decoders;
+    decoders.reserve(simulated.size());
     for (const std::size_t variant : simulated) {
         decoders.emplace_back(variants[variant], options.algorithm);
     }

@@ -152,17 +152,18 @@ ManifestFormat formatFrom(const base::Json& value, const Settings& settings, con
         const base::JsonMembers file(each, fileName + ": file of format " + found.name);
         found.files.push_back({file.text("name"), file.text("sha256")});
     }
-    std::size_t next = 0;
     const std::vector<Table> tables = Layout(*format, settings).tables;
+    std::vector<std::string> names;
     for (const Table& table : tables) {
-        for (const std::string& name : format->files(table)) {
-            if (next == found.files.size() || found.files[next].name != name) {
-                throw simulation::Error(place + " lacks the file " + name);
-            }
-            ++next;
+        const std::vector<std::string> ofTable = format->files(table);
+        names.insert(names.end(), ofTable.begin(), ofTable.end());
+    }
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        if (i == found.files.size() || found.files[i].name != names[i]) {
+            throw simulation::Error(std::string(place).append(" lacks the file ").append(names[i]));
         }
     }
-    if (next < found.files.size()) {
+    if (const std::size_t next = names.size(); next < found.files.size()) {
         throw simulation::Error(place + " has no file " + base::shown(found.files[next].name));
     }
     found.tables = tablesFrom(json.list("tables"), place, tables);

@@ -369,6 +369,7 @@ PYBIND11_MODULE(_core, module)
 }
 #undef PyInit__core
 
+// NOLINTNEXTLINE(bugprone-reserved-identifier): Python asks for this name.
 extern "C" PYBIND11_EXPORT PyObject* PyInit__core()
 {
     return isMainInterpreter() ? initialiseCore() : nullptr;
