@@ -56,9 +56,12 @@ EQUIVALENT = {
     ],
     "src/Trellis.h": [
         ("every bit that is not 0 is bit 1",
-         [("predecessor(state, 1)", "predecessor(state, 2)"), ("bestPath<1>", "bestPath<2>")]),
+         [("predecessor(state, 1)", "predecessor(state, 2)"), ("bestPath<1>", "bestPath<2>"),
+          ("successor(even, 1)", "successor(even, 2)"), ("successor(odd, 1)", "successor(odd, 2)")]),
         ("the two predecessors of a state are a pair and share a branch metric", [("branch(one);", "branch(zero);")]),
-        ("an array with an element more", [("Metric, 4> pair", "Metric, 5> pair")]),
+        ("an array with an element more",
+         [("Metric, 4> pair", "Metric, 5> pair"), ("Metric one[2]", "Metric one[3]"), ("Metric zero[2]", "Metric zero[3]"),
+          ("Wide x[3]", "Wide x[4]"), ("Wide p[3]", "Wide p[4]"), ("Wide q[3]", "Wide q[4]")]),
     ],
     "src/Segmentation.cpp": [
         ("127 and 128 steps are halved to 64 as well",
@@ -97,6 +100,11 @@ EQUIVALENT = {
     "lanes/Kernels.cpp": [
         ("a row of no lanes is never chosen, and one of more lanes costs time alone",
          [("Shape<8, 1, 2>::kernel", "Shape<8, 0, 2>::kernel"), ("Shape<8, 2>::kernel", "Shape<8, 3>::kernel")]),
+    ],
+    "lanes/Transpose.h": [
+        ("a value that equals the limit becomes the limit",
+         [("< -32768 ? -32768", "< -32767 ? -32768"), ("> 32767 ? 32767", "> 32766 ? 32767"),
+          ("copies[i] < -32768", "copies[i] <= -32768"), ("copies[i] > 32767", "copies[i] >= 32767")]),
     ],
     "lanes/Permute.h": [
         ("of an index word, the low five bits alone count",

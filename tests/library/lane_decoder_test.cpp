@@ -352,6 +352,36 @@ TEST_P(LaneDecoderTest, TiesAreDecodedAlike)
     }
 }
 
+/// Beside 127 and -128 alone, which leave no bit that could hide it.
+template <class Input>
+void expectEachNoticed(const lanes::InstructionSet& instructionSet, Input beyond)
+{
+    constexpr unsigned K = 40;
+    const std::unique_ptr<TInterleaver> interleaver(TInterleaver::create("3GPPLTE"));
+    LaneDecoder decoder(instructionSet, Algorithm::greatest, corrections);
+    decoder.setBlockCut(cutOf(K, 2, *interleaver));
+    for (const Input within : {Input{-128}, Input{127}}) {
+        std::vector<Input> values(3 * (K + 4), within);
+        const lanes::Streams<Input> streams = {&values[0], &values[K + 4], &values[2 * (K + 4)]};
+        EXPECT_TRUE(decoder.load(&streams, 1));
+        for (Input& value : values) {
+            value = beyond;
+            EXPECT_FALSE(decoder.load(&streams, 1)) << int{beyond} << " at " << &value - values.data();
+            value = within;
+        }
+    }
+}
+
+TEST_P(LaneDecoderTest, EachValueBeyondTheFormatIsNoticed)
+{
+    for (const std::int16_t beyond : std::vector<std::int16_t>{128, -129, 32767, -32768}) {
+        expectEachNoticed<std::int32_t>(*GetParam(), beyond);
+        expectEachNoticed<std::int16_t>(*GetParam(), beyond);
+    }
+    expectEachNoticed<std::int32_t>(*GetParam(), 32768);
+    expectEachNoticed<std::int32_t>(*GetParam(), -32769);
+}
+
 /// The components are slow in builds without optimisation and with sanitizers: there, a sample has to do.
 #if defined(__OPTIMIZE__) && !defined(__SANITIZE_ADDRESS__)
 constexpr unsigned combinationsPerOneTaken = 1;
