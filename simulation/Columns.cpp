@@ -172,11 +172,12 @@ const std::vector<Column> allColumns = {
 
 }  // namespace
 
-bool isVersion(std::string_view text)
+bool isVersion(std::string_view version)
 {
     constexpr std::size_t longest = 64;
-    return !text.empty() && text.size() <= longest &&
-           std::all_of(text.begin(), text.end(), [](char c) { return c > ' ' && c <= '~' && c != ',' && c != '"'; });
+    return !version.empty() && version.size() <= longest && std::all_of(version.begin(), version.end(), [](char c) {
+        return c > ' ' && c <= '~' && c != ',' && c != '"';
+    });
 }
 
 const std::vector<Column>& columns()

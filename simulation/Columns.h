@@ -21,7 +21,7 @@ struct Column {
 };
 
 /// Whether the text can be a version: short, printable, and a field of CSV as it is.
-bool isVersion(std::string_view text);
+bool isVersion(std::string_view version);
 
 /// All columns, in their order. Rates and bounds are written for the reader's sake; reading computes them anew.
 const std::vector<Column>& columns();
