@@ -11,7 +11,7 @@ namespace {
 
 using namespace morvik::vectors;
 
-void readManifest(const std::string& text)
+void readManifestText(const std::string& text)
 {
     try {
         const Manifest manifest = parseManifest(text, "in");
@@ -67,7 +67,7 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
     FuzzInput input(data, size);
     if (input.below(2) == 0) {
-        readManifest(input.text());
+        readManifestText(input.text());
     } else {
         readBlocks(input);
     }
