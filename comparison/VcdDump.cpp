@@ -390,8 +390,8 @@ private:
         itsDump.lineOf(place) = variable.value ? variable.line : itsFile.number();
         owner = number;
         waveform.times[itsDump.values.index(place)] = itsTime;
-        if (waveform.names.find(number) == waveform.names.end()) {
-            waveform.names[number] = itsScopes.pathOf(variable);
+        if (std::string& name = waveform.names[number]; name.empty()) {
+            name = itsScopes.pathOf(variable);
         }
     }
 
