@@ -5,8 +5,8 @@
 #include <sstream>
 
 #include "Text.h"
+#include "rules/BlockSizes.h"
 #include "simulation/Thousandths.h"
-#include "standard/BlockSizes.h"
 
 namespace morvik {
 

@@ -1,6 +1,6 @@
 // Arguments: what option values are allowed, and how a refusal reads.
-#ifndef MORVIK_ARGUMENTS_H
-#define MORVIK_ARGUMENTS_H
+#ifndef MORVIK_APP_ARGUMENTS_H
+#define MORVIK_APP_ARGUMENTS_H
 
 #include <CLI/CLI.hpp>
 #include <cstdint>

@@ -1,6 +1,6 @@
 // Command: what main needs to know of a subcommand.
-#ifndef MORVIK_COMMAND_H
-#define MORVIK_COMMAND_H
+#ifndef MORVIK_APP_COMMAND_H
+#define MORVIK_APP_COMMAND_H
 
 #include <CLI/CLI.hpp>
 #include <functional>

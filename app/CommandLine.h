@@ -1,6 +1,6 @@
 // CommandLine: what happens between the arguments of a program and its exit status.
-#ifndef MORVIK_COMMANDLINE_H
-#define MORVIK_COMMANDLINE_H
+#ifndef MORVIK_APP_COMMANDLINE_H
+#define MORVIK_APP_COMMANDLINE_H
 
 #include <CLI/CLI.hpp>
 #include <vector>

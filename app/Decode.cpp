@@ -15,7 +15,7 @@
 #include "Files.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
-#include "testbench/Decoder.h"
+#include "hardware/testbench/Decoder.h"
 
 namespace morvik {
 

@@ -1,20 +1,14 @@
 // DecoderOptions: the options that every decoding subcommand shares.
-#ifndef MORVIK_DECODEROPTIONS_H
-#define MORVIK_DECODEROPTIONS_H
+#ifndef MORVIK_APP_DECODEROPTIONS_H
+#define MORVIK_APP_DECODEROPTIONS_H
 
 #include <CLI/CLI.hpp>
 #include <cstdint>
 #include <string>
 
-#include "morvik_v1_0_bitacc_cmodel.h"
+#include "hardware/testbench/DecoderOptions.h"
 
 namespace morvik {
-
-/// How to decode. As it is made, it is the one default of all subcommands: the library's own core.
-struct DecoderOptions {
-    veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
-    std::uint32_t iterations = 8;
-};
 
 /// "2 units, scaled, 8 iterations".
 std::string coreText(const veltra_ip_morvik_v1_0_generics& generics, std::uint32_t iterations);

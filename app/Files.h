@@ -1,6 +1,6 @@
 // Files: the files and standard streams that a command reads and writes, and what can go wrong with them.
-#ifndef MORVIK_FILES_H
-#define MORVIK_FILES_H
+#ifndef MORVIK_APP_FILES_H
+#define MORVIK_APP_FILES_H
 
 #include <cstddef>
 #include <fstream>

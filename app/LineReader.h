@@ -1,6 +1,6 @@
 // LineReader: a text read line by line, with the place for messages.
-#ifndef MORVIK_LINEREADER_H
-#define MORVIK_LINEREADER_H
+#ifndef MORVIK_APP_LINEREADER_H
+#define MORVIK_APP_LINEREADER_H
 
 #include <cstddef>
 #include <istream>

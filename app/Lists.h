@@ -1,6 +1,6 @@
 // Lists: option values with commas between them.
-#ifndef MORVIK_LISTS_H
-#define MORVIK_LISTS_H
+#ifndef MORVIK_APP_LISTS_H
+#define MORVIK_APP_LISTS_H
 
 #include <CLI/CLI.hpp>
 #include <algorithm>

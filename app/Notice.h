@@ -1,6 +1,6 @@
 // Notice: what a command tells beside its results.
-#ifndef MORVIK_NOTICE_H
-#define MORVIK_NOTICE_H
+#ifndef MORVIK_APP_NOTICE_H
+#define MORVIK_APP_NOTICE_H
 
 #include <string>
 

@@ -2,11 +2,11 @@
 #include "Programs.h"
 
 #include "Decode.h"
+#include "Doctor.h"
 #include "Trace.h"
 #include "Vectors.h"
 #include "ber/Merge.h"
 #include "compare/Compare.h"
-#include "doctor/Doctor.h"
 #include "info/Info.h"
 #include "selftest/SelfTest.h"
 

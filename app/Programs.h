@@ -1,7 +1,7 @@
 // Programs: what the commands `morvik` and `morvik-mpi` take. Their mains run them; pages and completions describe
 // them.
-#ifndef MORVIK_PROGRAMS_H
-#define MORVIK_PROGRAMS_H
+#ifndef MORVIK_APP_PROGRAMS_H
+#define MORVIK_APP_PROGRAMS_H
 
 #include <CLI/CLI.hpp>
 #include <memory>

@@ -1,6 +1,6 @@
 // ReferenceBits: the bits that were sent, from text with one line of 0 and 1 for each block.
-#ifndef MORVIK_REFERENCEBITS_H
-#define MORVIK_REFERENCEBITS_H
+#ifndef MORVIK_APP_REFERENCEBITS_H
+#define MORVIK_APP_REFERENCEBITS_H
 
 #include <cstddef>
 #include <cstdint>

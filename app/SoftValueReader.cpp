@@ -7,7 +7,7 @@
 
 #include "Text.h"
 #include "base/Csv.h"
-#include "standard/BlockSizes.h"
+#include "rules/BlockSizes.h"
 
 namespace morvik {
 

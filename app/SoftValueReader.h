@@ -1,6 +1,6 @@
 // SoftValueReader: blocks of soft values from CSV text.
-#ifndef MORVIK_SOFTVALUEREADER_H
-#define MORVIK_SOFTVALUEREADER_H
+#ifndef MORVIK_APP_SOFTVALUEREADER_H
+#define MORVIK_APP_SOFTVALUEREADER_H
 
 #include <cstddef>
 #include <cstdint>
@@ -10,7 +10,7 @@
 
 #include "Files.h"
 #include "LineReader.h"
-#include "testbench/SoftBlock.h"
+#include "hardware/testbench/SoftBlock.h"
 
 namespace morvik {
 

@@ -1,6 +1,6 @@
 // Text: integers read from text, and text shown in messages.
-#ifndef MORVIK_TEXT_H
-#define MORVIK_TEXT_H
+#ifndef MORVIK_APP_TEXT_H
+#define MORVIK_APP_TEXT_H
 
 #include <charconv>
 #include <optional>

@@ -15,8 +15,8 @@
 #include "Files.h"
 #include "Lists.h"
 #include "SoftValueReader.h"
+#include "hardware/trace/TraceWriter.h"
 #include "simulation/Error.h"
-#include "trace/TraceWriter.h"
 
 namespace morvik {
 

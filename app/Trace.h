@@ -1,6 +1,6 @@
 // Trace: the subcommand that writes the values inside of chosen passes.
-#ifndef MORVIK_TRACE_H
-#define MORVIK_TRACE_H
+#ifndef MORVIK_APP_TRACE_H
+#define MORVIK_APP_TRACE_H
 
 #include "Command.h"
 

@@ -12,10 +12,10 @@
 #include "Lists.h"
 #include "Notice.h"
 #include "base/Printable.h"
+#include "hardware/vectors/Set.h"
 #include "simulation/Error.h"
 #include "simulation/Point.h"
 #include "simulation/Thousandths.h"
-#include "vectors/Set.h"
 
 namespace morvik {
 

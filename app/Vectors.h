@@ -1,6 +1,6 @@
 // Vectors: the subcommand that makes stimulus and expected values for a test bench.
-#ifndef MORVIK_VECTORS_H
-#define MORVIK_VECTORS_H
+#ifndef MORVIK_APP_VECTORS_H
+#define MORVIK_APP_VECTORS_H
 
 #include "Command.h"
 

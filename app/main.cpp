@@ -7,7 +7,7 @@
 
 int main(int argc, char** argv)
 {
-    base::prepareStandardStreams();
+    morvik::base::prepareStandardStreams();
     std::ios::sync_with_stdio(false);  // a trace writes millions of small pieces
 
     const morvik::Program program = morvik::morvikProgram();

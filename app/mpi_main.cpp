@@ -17,8 +17,8 @@
 namespace {
 
 using morvik::BerOptions;
-using simulation::MpiWorld;
-using simulation::Plan;
+using morvik::simulation::MpiWorld;
+using morvik::simulation::Plan;
 
 /// MPI starts a process for each core, unless it is told otherwise.
 unsigned threadsOf(const BerOptions& options)
@@ -29,7 +29,8 @@ unsigned threadsOf(const BerOptions& options)
 int runAsRankZero(MpiWorld& world, int argc, const char* const* argv)
 {
     const auto makeWorkers = [&world](const BerOptions& options, const Plan& plan) {
-        return std::make_unique<simulation::MpiWorkers>(world, plan, threadsOf(options), options.instructionSet);
+        return std::make_unique<morvik::simulation::MpiWorkers>(
+            world, plan, threadsOf(options), options.instructionSet);
     };
     const morvik::Program program = morvik::morvikMpiProgram(makeWorkers);
     const int status = morvik::runCommandLine(*program.arguments, program.commands, argc, argv);
@@ -54,12 +55,12 @@ int runAsOtherRank(int argc, const char* const* argv)
         app.parse(argc, argv);
         plan = planOf(options);
     } catch (const CLI::ParseError&) {
-    } catch (const simulation::Error&) {
+    } catch (const morvik::simulation::Error&) {
     }
     for (const int signal : {SIGINT, SIGTERM, SIGHUP}) {
         std::signal(signal, SIG_IGN);  // rank 0 has them, too, and ends the work of all when its own is saved
     }
-    simulation::workForRankZero(plan ? &*plan : nullptr, threadsOf(options), options.instructionSet);
+    morvik::simulation::workForRankZero(plan ? &*plan : nullptr, threadsOf(options), options.instructionSet);
     return morvik::success;
 }
 
@@ -67,7 +68,7 @@ int runAsOtherRank(int argc, const char* const* argv)
 
 int main(int argc, char** argv)
 {
-    base::prepareStandardStreams();  // before MPI opens anything
+    morvik::base::prepareStandardStreams();  // before MPI opens anything
     MpiWorld world;
     return world.rank() == 0 ? runAsRankZero(world, argc, argv) : runAsOtherRank(argc, argv);
 }

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-namespace base {
+namespace morvik::base {
 
 /// What some programs write before a text in UTF-8.
 constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
@@ -36,6 +36,6 @@ inline std::vector<std::string_view> fieldsOf(std::string_view line)
     return fields;
 }
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

@@ -11,7 +11,7 @@
 #include <string_view>
 #include <utility>
 
-namespace base {
+namespace morvik::base {
 
 /// An open file, closed at the end of its life.
 class Descriptor {
@@ -90,6 +90,6 @@ private:
     int itsNumber;
 };
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

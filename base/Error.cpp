@@ -4,11 +4,11 @@
 #include <cerrno>
 #include <system_error>
 
-namespace base {
+namespace morvik::base {
 
 Error fileError(const std::string& file, const std::string& action)
 {
     return Error(file + ": cannot be " + action + ": " + std::generic_category().message(errno));
 }
 
-}  // namespace base
+}  // namespace morvik::base

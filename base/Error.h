@@ -5,7 +5,7 @@
 #include <stdexcept>
 #include <string>
 
-namespace base {
+namespace morvik::base {
 
 /// Something is wrong with what the user gave or with a file. The text is one line.
 class Error : public std::runtime_error {
@@ -16,6 +16,6 @@ public:
 /// "FILE: cannot be ACTION: " and the operating system's reason for the failure just seen, errno.
 Error fileError(const std::string& file, const std::string& action);
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

@@ -10,7 +10,7 @@
 #include "Error.h"
 #include "Shown.h"
 
-namespace base {
+namespace morvik::base {
 
 namespace {
 
@@ -235,4 +235,4 @@ void JsonMembers::refuse(const std::string& name, const std::string& expectation
     throw Error(itsPlace + ": " + shown(name) + " is " + shownValue(at(name)) + ", " + expectation);
 }
 
-}  // namespace base
+}  // namespace morvik::base

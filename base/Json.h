@@ -7,7 +7,7 @@
 #include <nlohmann/json.hpp>
 #include <string>
 
-namespace base {
+namespace morvik::base {
 
 using Json = nlohmann::json;
 
@@ -55,6 +55,6 @@ private:
     std::string itsPlace;
 };
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

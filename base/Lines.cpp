@@ -3,7 +3,7 @@
 
 #include "Csv.h"
 
-namespace base {
+namespace morvik::base {
 
 Lines::Lines(std::istream& input, std::size_t longest)
     : itsInput(input),
@@ -38,4 +38,4 @@ Lines::Found Lines::next()
     return isWhole && itsText.size() <= itsLongest ? Found::line : Found::tooLong;
 }
 
-}  // namespace base
+}  // namespace morvik::base

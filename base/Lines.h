@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-namespace base {
+namespace morvik::base {
 
 /// Takes lines that end in \n, \r\n or the end of the text. Memory does not grow with the input. A byte order mark
 /// before the first line, which spreadsheets write, is no part of it.
@@ -35,6 +35,6 @@ private:
     bool itsIsFirst = true;
 };
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

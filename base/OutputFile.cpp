@@ -17,7 +17,7 @@
 
 #include "Error.h"
 
-namespace base {
+namespace morvik::base {
 
 namespace {
 
@@ -283,4 +283,4 @@ bool isSamePlace(const std::string& a, const std::string& b)
     return whole(a) == whole(b);
 }
 
-}  // namespace base
+}  // namespace morvik::base

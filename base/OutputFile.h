@@ -8,7 +8,7 @@
 
 #include "Descriptor.h"
 
-namespace base {
+namespace morvik::base {
 
 /// What names standard input and output where a file may be named.
 constexpr char standardStream[] = "-";
@@ -79,6 +79,6 @@ void expectOwnFile(const std::string& name, const std::vector<std::string>& inpu
 /// Whether what is written to one file would take the other's place. Throws Error if a link leads nowhere.
 bool isSamePlace(const std::string& a, const std::string& b);
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

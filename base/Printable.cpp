@@ -1,7 +1,7 @@
 // Printable: texts of unknown content, as a terminal may get them.
 #include "Printable.h"
 
-namespace base {
+namespace morvik::base {
 
 namespace {
 
@@ -98,4 +98,4 @@ std::string shortened(std::string_view text, std::size_t longest)
     return result;
 }
 
-}  // namespace base
+}  // namespace morvik::base

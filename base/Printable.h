@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-namespace base {
+namespace morvik::base {
 
 /// The length of the character of UTF-8 that the text, which is not empty, begins with; 0 where there is none.
 std::size_t lengthOfFirst(std::string_view text);
@@ -21,6 +21,6 @@ std::string visibleLines(std::string_view text);
 /// The visible text, of one that has more than so many bytes the start. No character and no \x1b is cut in two.
 std::string shortened(std::string_view text, std::size_t longest);
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

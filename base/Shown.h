@@ -7,7 +7,7 @@
 
 #include "Printable.h"
 
-namespace base {
+namespace morvik::base {
 
 /// A name or value from a file, in quotation marks.
 inline std::string shown(std::string_view text)
@@ -16,6 +16,6 @@ inline std::string shown(std::string_view text)
     return '"' + shortened(text, longest) + '"';
 }
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

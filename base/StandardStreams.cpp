@@ -9,7 +9,7 @@
 #include <cstdlib>
 #include <initializer_list>
 
-namespace base {
+namespace morvik::base {
 
 void prepareStandardStreams()
 {
@@ -25,4 +25,4 @@ void prepareStandardStreams()
     std::signal(SIGXFSZ, SIG_IGN);
 }
 
-}  // namespace base
+}  // namespace morvik::base

@@ -2,7 +2,7 @@
 #ifndef MORVIK_BASE_STANDARDSTREAMS_H
 #define MORVIK_BASE_STANDARDSTREAMS_H
 
-namespace base {
+namespace morvik::base {
 
 /// Gives those that are closed to something that can be neither read nor written. Otherwise the first files that the
 /// program opens would get their numbers, and what is printed would go into them. Also lets a file that grows beyond
@@ -10,6 +10,6 @@ namespace base {
 /// beginning of main.
 void prepareStandardStreams();
 
-}  // namespace base
+}  // namespace morvik::base
 
 #endif

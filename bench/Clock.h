@@ -5,7 +5,7 @@
 #include <cstdint>
 #include <ctime>
 
-namespace bench {
+namespace morvik::bench {
 
 /// Processor time that this thread has used, in seconds.
 inline double processorTime()
@@ -51,6 +51,6 @@ private:
     double itsStart;
 };
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

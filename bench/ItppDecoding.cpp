@@ -7,7 +7,7 @@
 
 #include "TInterleaver.h"
 
-namespace bench {
+namespace morvik::bench {
 
 namespace {
 
@@ -103,4 +103,4 @@ std::unique_ptr<Decoding> makeItppDecoding(const Work& work)
     return std::make_unique<ItppDecoding>(work);
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

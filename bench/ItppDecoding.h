@@ -4,13 +4,13 @@
 
 #include "Work.h"
 
-namespace bench {
+namespace morvik::bench {
 
 /// Whether the program was built with IT++.
 bool itppAvailable();
 
 std::unique_ptr<Decoding> makeItppDecoding(const Work& work);
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

@@ -4,10 +4,10 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "../lanes/InstructionSets.h"
-#include "../src/Segmentation.h"
 #include "Measure.h"
 #include "Probe.h"
+#include "lanes/InstructionSets.h"
+#include "src/Segmentation.h"
 
 // One compilation of Probe.cpp defines each.
 namespace probe_generic {
@@ -23,7 +23,7 @@ namespace probe_avx512 {
 extern const bench::ProbeSet probeSet;
 }
 
-namespace bench {
+namespace morvik::bench {
 
 namespace {
 
@@ -95,4 +95,4 @@ double Limits::cyclesPerStep(const Work& work) const
     return 0;
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

@@ -7,7 +7,7 @@
 
 #include "Work.h"
 
-namespace bench {
+namespace morvik::bench {
 
 class Limits {
 public:
@@ -32,6 +32,6 @@ private:
     std::vector<Limit> itsLimits;
 };
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

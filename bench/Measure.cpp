@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <stdexcept>
 
-namespace bench {
+namespace morvik::bench {
 
 double median(std::vector<double> values)
 {
@@ -52,4 +52,4 @@ void checkDecisions(const Work& work, double bitErrorRate)
     }
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

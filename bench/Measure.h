@@ -7,7 +7,7 @@
 #include "Clock.h"
 #include "Work.h"
 
-namespace bench {
+namespace morvik::bench {
 
 struct Figures {
     double megabitsPerSecond;
@@ -30,6 +30,6 @@ Figures medians(const std::vector<Figures>& all);
 /// every sixth bit would be wrong.
 void checkDecisions(const Work& work, double bitErrorRate);
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

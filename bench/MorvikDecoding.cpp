@@ -6,7 +6,7 @@
 
 #include "morvik_v1_0_batch.h"
 
-namespace bench {
+namespace morvik::bench {
 
 namespace {
 
@@ -100,4 +100,4 @@ std::unique_ptr<Decoding> makeMorvikDecoding(const Work& work)
     return std::make_unique<MorvikDecoding>(work);
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

@@ -4,10 +4,10 @@
 
 #include "Work.h"
 
-namespace bench {
+namespace morvik::bench {
 
 std::unique_ptr<Decoding> makeMorvikDecoding(const Work& work);
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

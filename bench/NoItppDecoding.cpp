@@ -3,7 +3,7 @@
 
 #include "ItppDecoding.h"
 
-namespace bench {
+namespace morvik::bench {
 
 bool itppAvailable()
 {
@@ -15,4 +15,4 @@ std::unique_ptr<Decoding> makeItppDecoding(const Work& work)
     throw std::runtime_error(work.name() + ": built without IT++");
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

@@ -6,7 +6,7 @@
 
 #include "support/Blocks.h"
 
-namespace bench {
+namespace morvik::bench {
 
 namespace {
 
@@ -47,4 +47,4 @@ NoisyBlocks cleanBlocks(unsigned K, unsigned count)
     return makeBlocks(K, count, 0.0);
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <vector>
 
-namespace bench {
+namespace morvik::bench {
 
 /// Codewords of one size, the same ones in every run, as soft values of the core's input format; the
 /// three streams block after block, K + 4 values each.
@@ -21,6 +21,6 @@ NoisyBlocks noisyBlocks(unsigned K, unsigned count);
 /// The same without noise.
 NoisyBlocks cleanBlocks(unsigned K, unsigned count);
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

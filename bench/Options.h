@@ -5,7 +5,7 @@
 #include <CLI/CLI.hpp>
 #include <string>
 
-namespace bench {
+namespace morvik::bench {
 
 struct Options {
     std::string filter = ".*";
@@ -23,6 +23,6 @@ inline void addOptions(CLI::App& app, Options& options)
     app.add_flag("--list", options.list, "Only print the names of the lines");
 }
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

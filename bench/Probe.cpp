@@ -3,9 +3,9 @@
 
 #include <cstddef>
 
-#include "../lanes/Words.h"
-#include "../src/Trellis.h"
-#include "../src/TrellisDecision.h"
+#include "lanes/Words.h"
+#include "rules/Trellis.h"
+#include "rules/TrellisDecision.h"
 
 namespace MORVIK_LANES {
 namespace {
@@ -21,14 +21,14 @@ struct Loop {
     /// pairs of states, because LTE has no second parity stream. Side by side, a step's loads never look
     /// to the processor like another step's stores, at an address that is equal in the low 12 bits.
     static constexpr std::size_t slot = (states + 2) * count;
-    alignas(64) static inline std::int16_t slots[bench::Probe::steps * slot];
+    alignas(64) static inline std::int16_t slots[morvik::bench::Probe::steps * slot];
 
     static __attribute__((flatten, noinline)) void run(unsigned rounds)
     {
         for (unsigned round = 0; round < rounds; ++round) {
             asm volatile("" ::"r"(slots) : "memory");  // as if somebody else filled and read them
             trellis::Column<Decision> a{};
-            for (std::int16_t* to = slots; to != slots + bench::Probe::steps * slot; to += slot) {
+            for (std::int16_t* to = slots; to != slots + morvik::bench::Probe::steps * slot; to += slot) {
                 const Value g0 = Value::load(to + states * count);
                 const Value g1 = Value::load(to + (states + 1) * count);
                 trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA { a[state].store(to + state * count); });
@@ -38,10 +38,10 @@ struct Loop {
         asm volatile("" ::"r"(slots) : "memory");
     }
 
-    static constexpr bench::Probe probe = {count, run};
+    static constexpr morvik::bench::Probe probe = {count, run};
 };
 
-constexpr bench::Probe probes[] = {
+constexpr morvik::bench::Probe probes[] = {
     Loop<8>::probe,
 #if defined(__AVX2__)
     Loop<16>::probe,
@@ -53,7 +53,8 @@ constexpr bench::Probe probes[] = {
 
 }  // namespace
 
-extern const bench::ProbeSet probeSet;
-const bench::ProbeSet probeSet = {MORVIK_LANES_NAME, probes, static_cast<unsigned>(sizeof probes / sizeof probes[0])};
+extern const morvik::bench::ProbeSet probeSet;
+const morvik::bench::ProbeSet probeSet = {
+    MORVIK_LANES_NAME, probes, static_cast<unsigned>(sizeof probes / sizeof probes[0])};
 
 }  // namespace MORVIK_LANES

@@ -2,7 +2,7 @@
 #ifndef MORVIK_BENCH_PROBE_H
 #define MORVIK_BENCH_PROBE_H
 
-namespace bench {
+namespace morvik::bench {
 
 /// The loop at one width, a vector of so many lanes.
 struct Probe {
@@ -21,6 +21,6 @@ struct ProbeSet {
     unsigned count;
 };
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

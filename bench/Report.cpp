@@ -7,7 +7,7 @@
 
 #include "ItppDecoding.h"
 
-namespace bench {
+namespace morvik::bench {
 
 namespace {
 
@@ -152,4 +152,4 @@ void Report::finish()
     printLimits();
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

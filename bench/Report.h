@@ -7,7 +7,7 @@
 #include "Limits.h"
 #include "Measure.h"
 
-namespace bench {
+namespace morvik::bench {
 
 /// Prints lines as they come; each table begins with its first line.
 class Report {
@@ -30,6 +30,6 @@ private:
     bool itsComparisonBegun = false;
 };
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

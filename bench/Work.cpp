@@ -4,11 +4,11 @@
 #include <cstddef>
 #include <utility>
 
-#include "../lanes/InstructionSets.h"
 #include "ItppDecoding.h"
 #include "MorvikDecoding.h"
+#include "lanes/InstructionSets.h"
 
-namespace bench {
+namespace morvik::bench {
 
 namespace {
 
@@ -89,4 +89,4 @@ std::unique_ptr<Decoding> makeDecoding(const Work& work)
     return work.decoder == Work::Decoder::itpp ? makeItppDecoding(work) : makeMorvikDecoding(work);
 }
 
-}  // namespace bench
+}  // namespace morvik::bench

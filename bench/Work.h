@@ -9,7 +9,7 @@
 
 #include "NoisyBlocks.h"
 
-namespace bench {
+namespace morvik::bench {
 
 /// Full iterations of every line.
 constexpr unsigned iterations = 6;
@@ -64,6 +64,6 @@ protected:
 /// Throws when the work cannot be done.
 std::unique_ptr<Decoding> makeDecoding(const Work& work);
 
-}  // namespace bench
+}  // namespace morvik::bench
 
 #endif

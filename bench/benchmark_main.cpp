@@ -9,8 +9,8 @@
 
 namespace {
 
-using bench::Figures;
-using bench::Work;
+using morvik::bench::Figures;
+using morvik::bench::Work;
 
 /// The figures as Google Benchmark keeps them.
 constexpr struct {
@@ -25,15 +25,15 @@ constexpr struct {
 void measure(benchmark::State& state, const Work& work, double limit)
 {
     try {
-        const auto decoding = bench::makeDecoding(work);
+        const auto decoding = morvik::bench::makeDecoding(work);
         decoding->run();
-        bench::checkDecisions(work, decoding->bitErrorRate());
-        const bench::Stopwatch stopwatch;
+        morvik::bench::checkDecisions(work, decoding->bitErrorRate());
+        const morvik::bench::Stopwatch stopwatch;
         for ([[maybe_unused]] const auto& run : state) {
             decoding->run();
         }
-        const bench::Sample sample = stopwatch.stop(static_cast<double>(state.iterations()));
-        const Figures figures = bench::figures(work, *decoding, sample, limit);
+        const morvik::bench::Sample sample = stopwatch.stop(static_cast<double>(state.iterations()));
+        const Figures figures = morvik::bench::figures(work, *decoding, sample, limit);
         for (const auto& counter : counters) {
             state.counters[counter.name] = figures.*counter.figure;
         }
@@ -45,7 +45,7 @@ void measure(benchmark::State& state, const Work& work, double limit)
 /// Hands each line's medians to the report.
 class Reporter : public benchmark::BenchmarkReporter {
 public:
-    Reporter(bench::Report& report, const std::vector<Work>& all) : itsReport(report)
+    Reporter(morvik::bench::Report& report, const std::vector<Work>& all) : itsReport(report)
     {
         for (const Work& work : all) {
             itsWork.emplace(work.name(), work);
@@ -79,19 +79,19 @@ public:
     }
 
 private:
-    bench::Report& itsReport;
+    morvik::bench::Report& itsReport;
     std::map<std::string, Work> itsWork;
     bool itsFailed = false;
 };
 
 int runBenchmarks(const std::vector<Work>& all)
 {
-    const bench::Limits limits;
+    const morvik::bench::Limits limits;
     for (const Work& work : all) {
         benchmark::RegisterBenchmark(work.name().c_str(), measure, work, limits.cyclesPerStep(work))
             ->Unit(benchmark::kMicrosecond);
     }
-    bench::Report report(std::cout, limits);
+    morvik::bench::Report report(std::cout, limits);
     Reporter reporter(report, all);
     const bool none = benchmark::RunSpecifiedBenchmarks(&reporter) == 0;
     if (!none) {
@@ -101,7 +101,7 @@ int runBenchmarks(const std::vector<Work>& all)
 }
 
 /// The options in the words of Google Benchmark, and then arguments of its own.
-std::vector<std::string> benchmarkArguments(const bench::Options& options,
+std::vector<std::string> benchmarkArguments(const morvik::bench::Options& options,
                                             const std::string& json,
                                             const std::vector<std::string>& others)
 {
@@ -140,9 +140,9 @@ int main(int argc, char** argv)
 {
     CLI::App app("Measures how fast morvik decodes. Takes the options of Google Benchmark, too.", "morvik_bench");
     app.allow_extras();
-    bench::Options options;
+    morvik::bench::Options options;
     std::string json;
-    bench::addOptions(app, options);
+    morvik::bench::addOptions(app, options);
     app.add_option("--json", json, "Also write all figures to this file");
     CLI11_PARSE(app, argc, argv);
     std::vector<std::string> arguments = benchmarkArguments(options, json, app.remaining());
@@ -150,7 +150,7 @@ int main(int argc, char** argv)
         return 1;
     }
     try {
-        return runBenchmarks(bench::allWork());
+        return runBenchmarks(morvik::bench::allWork());
     } catch (const std::exception& error) {
         std::cerr << "morvik_bench: " << error.what() << '\n';
         return 1;

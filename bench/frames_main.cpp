@@ -79,26 +79,26 @@ public:
                                                 itsFrames.streams[2].data(),
                                                 static_cast<std::int32_t>(itsK + 4),
                                                 itsCount,
-                                                bench::iterations,
+                                                morvik::bench::iterations,
                                                 nullptr,
                                                 &outputs);
     }
 
     /// Cycles for an information bit, the median of the repetitions.
-    double cycles(void (Stages::*stage)(), const bench::Options& options)
+    double cycles(void (Stages::*stage)(), const morvik::bench::Options& options)
     {
-        const bench::Stopwatch once;
+        const morvik::bench::Stopwatch once;
         (this->*stage)();
         const auto calls = static_cast<unsigned>(options.seconds / once.stop(1).seconds) + 1;
         std::vector<double> samples;
         for (unsigned i = 0; i < options.repetitions; ++i) {
-            const bench::Stopwatch stopwatch;
+            const morvik::bench::Stopwatch stopwatch;
             for (unsigned call = 0; call < calls; ++call) {
                 (this->*stage)();
             }
             samples.push_back(stopwatch.stop(calls).cycles / (double{1} * itsK * itsCount));
         }
-        return bench::median(samples);
+        return morvik::bench::median(samples);
     }
 
 private:
@@ -107,17 +107,17 @@ private:
     TurboEncoder itsEncoder;
     SoftValueSampler itsSampler;
     FrameSource itsSource;
-    blocks::Decoder itsDecoder;
+    morvik::blocks::Decoder itsDecoder;
     PackedBlocks itsInformation;
     TurboEncoder::Streams itsStreams;
     Frames itsFrames;
     std::vector<std::uint8_t> itsDecisions;
 };
 
-void measure(const bench::Options& options)
+void measure(const morvik::bench::Options& options)
 {
     std::cout
-        << "Making frames, and decoding them with 4 units, type 1, " << bench::iterations
+        << "Making frames, and decoding them with 4 units, type 1, " << morvik::bench::iterations
         << " iterations: cycles for an information bit\n\n"
         << "|    K | frames a call | instructions | encode | soft values | make, in all | decode | make / decode |\n"
         << "|-----:|--------------:|--------------|-------:|------------:|-------------:|-------:|--------------:|\n"
@@ -145,7 +145,7 @@ void measure(const bench::Options& options)
 int main(int argc, char** argv)
 {
     CLI::App app("Measures what it takes to make the frames of a simulation.", "morvik_bench_frames");
-    bench::Options options;
+    morvik::bench::Options options;
     app.add_option("--repetitions", options.repetitions, "Of each figure, which is their median")
         ->check(CLI::Range(1U, 1000U));
     app.add_option("--seconds", options.seconds, "That a repetition takes at least")->check(CLI::Range(0.0, 100.0));

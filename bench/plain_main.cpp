@@ -8,14 +8,14 @@
 
 namespace {
 
-using bench::Figures;
-using bench::Work;
+using morvik::bench::Figures;
+using morvik::bench::Work;
 
 std::vector<Work> chosenWork(const std::string& filter)
 {
     const std::regex wanted(filter, std::regex::extended);
     std::vector<Work> chosen;
-    for (const Work& work : bench::allWork()) {
+    for (const Work& work : morvik::bench::allWork()) {
         if (std::regex_search(work.name(), wanted)) {
             chosen.push_back(work);
         }
@@ -26,41 +26,41 @@ std::vector<Work> chosenWork(const std::string& filter)
     return chosen;
 }
 
-bench::Sample sample(bench::Decoding& decoding, unsigned runs)
+morvik::bench::Sample sample(morvik::bench::Decoding& decoding, unsigned runs)
 {
-    const bench::Stopwatch stopwatch;
+    const morvik::bench::Stopwatch stopwatch;
     for (unsigned i = 0; i < runs; ++i) {
         decoding.run();
     }
     return stopwatch.stop(runs);
 }
 
-Figures measure(const Work& work, const bench::Options& options, double limit)
+Figures measure(const Work& work, const morvik::bench::Options& options, double limit)
 {
-    const auto decoding = bench::makeDecoding(work);
+    const auto decoding = morvik::bench::makeDecoding(work);
     decoding->run();
-    bench::checkDecisions(work, decoding->bitErrorRate());
+    morvik::bench::checkDecisions(work, decoding->bitErrorRate());
     const double once = sample(*decoding, 1).seconds;
     const auto runs = static_cast<unsigned>(options.seconds / once) + 1;
     std::vector<Figures> all;
     for (unsigned i = 0; i < options.repetitions; ++i) {
-        all.push_back(bench::figures(work, *decoding, sample(*decoding, runs), limit));
+        all.push_back(morvik::bench::figures(work, *decoding, sample(*decoding, runs), limit));
     }
-    return bench::medians(all);
+    return morvik::bench::medians(all);
 }
 
-void measureAll(const bench::Options& options)
+void measureAll(const morvik::bench::Options& options)
 {
     const std::vector<Work> chosen = chosenWork(options.filter);
-    const bench::Limits limits;
-    bench::Report report(std::cout, limits);
+    const morvik::bench::Limits limits;
+    morvik::bench::Report report(std::cout, limits);
     for (const Work& work : chosen) {
         report.add(work, measure(work, options, limits.cyclesPerStep(work)));
     }
     report.finish();
 }
 
-void list(const bench::Options& options)
+void list(const morvik::bench::Options& options)
 {
     for (const Work& work : chosenWork(options.filter)) {
         std::cout << work.name() << '\n';
@@ -72,8 +72,8 @@ void list(const bench::Options& options)
 int main(int argc, char** argv)
 {
     CLI::App app("Measures how fast morvik decodes.", "morvik_bench_plain");
-    bench::Options options;
-    bench::addOptions(app, options);
+    morvik::bench::Options options;
+    morvik::bench::addOptions(app, options);
     CLI11_PARSE(app, argc, argv);
     try {
         (options.list ? list : measureAll)(options);

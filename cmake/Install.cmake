@@ -18,7 +18,6 @@ install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 # The class headers, and those that they need. Their names are common: they keep to a folder of their own.
 set(classes_dir ${CMAKE_INSTALL_INCLUDEDIR}/morvik_v1_0_classes)
 set(MORVIK_CLASS_HEADERS
-    Arithmetic.h
     Misc.h
     T8.h
     TCalculationEngine.h
@@ -33,6 +32,7 @@ set(MORVIK_CLASS_HEADERS
     TNumberFormat.h)
 list(TRANSFORM MORVIK_CLASS_HEADERS PREPEND ${PROJECT_SOURCE_DIR}/src/)
 install(FILES ${MORVIK_CLASS_HEADERS} DESTINATION ${classes_dir})
+install(FILES rules/Arithmetic.h DESTINATION ${classes_dir}/rules)
 target_include_directories(morvik_classes INTERFACE $<INSTALL_INTERFACE:${classes_dir}>)
 
 set(commands morvik)

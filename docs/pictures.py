@@ -377,8 +377,8 @@ def flow():
     components.again(right[1] + 32, right[2] - 12, "2 x iterations")
 
     bottom = both.station(max(left[-1], right[-1]) + 30, "The arithmetic of both, written once",
-                          "src/Trellis.h: branchSums, forwardStep, backwardStep, tailColumn",
-                          "src/Arithmetic.h: addWrap, subWrap, maxWrap, clip")
+                          "rules/Trellis.h: branchSums, forwardStep, backwardStep, tailColumn",
+                          "rules/Arithmetic.h: addWrap, subWrap, maxWrap, clip")
     return svg(1100, bottom + 20, both.elements + lanes.elements + components.elements)
 
 

@@ -4,10 +4,10 @@
 #include <algorithm>
 #include <utility>
 
-#include "../src/Trellis.h"
 #include "Bounds.h"
 #include "InstructionSets.h"
 #include "Unaligned.h"
+#include "rules/Trellis.h"
 
 namespace lanes {
 

@@ -4,12 +4,12 @@
 
 #include <cstddef>
 
-#include "../src/Trellis.h"
 #include "Bounds.h"
 #include "Permute.h"
 #include "Rules.h"
 #include "Words.h"
 #include "Workspace.h"
+#include "rules/Trellis.h"
 
 namespace MORVIK_LANES {
 

@@ -2,8 +2,8 @@
 #ifndef MORVIK_LANES_PERMUTE_H
 #define MORVIK_LANES_PERMUTE_H
 
-#include "../src/Trellis.h"
 #include "Words.h"
+#include "rules/Trellis.h"
 
 namespace MORVIK_LANES {
 

@@ -2,10 +2,10 @@
 #ifndef MORVIK_LANES_RULES_H
 #define MORVIK_LANES_RULES_H
 
-#include "../src/Trellis.h"
-#include "../src/TrellisDecision.h"
 #include "Permute.h"
 #include "Words.h"
+#include "rules/Trellis.h"
+#include "rules/TrellisDecision.h"
 
 namespace MORVIK_LANES {
 

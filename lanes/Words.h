@@ -11,7 +11,7 @@
 #include <cstdint>
 #include <cstring>
 
-#include "../src/Arithmetic.h"
+#include "rules/Arithmetic.h"
 
 #if defined(__SSE2__)
 #include <immintrin.h>

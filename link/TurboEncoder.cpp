@@ -5,8 +5,8 @@
 #include <stdexcept>
 #include <string>
 
-#include "../standard/BlockSizes.h"
 #include "BitMatrix.h"
+#include "rules/BlockSizes.h"
 
 namespace morvik::link {
 

@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-namespace report {
+namespace morvik::report {
 
 /// What a program leaves behind.
 struct Outcome {
@@ -18,6 +18,6 @@ struct Outcome {
 /// std::system_error when it cannot be started.
 Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

@@ -7,7 +7,7 @@
 
 #include "Wording.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -87,4 +87,4 @@ std::vector<Curve> againstIterations(const std::vector<Curve>& curves)
     return result;
 }
 
-}  // namespace report
+}  // namespace morvik::report

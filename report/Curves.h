@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-namespace report {
+namespace morvik::report {
 
 /// Stands for a figure that is not known.
 constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
@@ -70,6 +70,6 @@ std::vector<Curve> curvesOf(const std::vector<Row>& rows);
 /// that differ in Eb/N0 alone are a family.
 std::vector<Curve> againstIterations(const std::vector<Curve>& curves);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

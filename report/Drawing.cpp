@@ -6,7 +6,7 @@
 #include "PlotScript.h"
 #include "Wording.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -80,4 +80,4 @@ std::string Drawing::script(const std::string& suffix) const
     return text + "plot NaN notitle\n";
 }
 
-}  // namespace report
+}  // namespace morvik::report

@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-namespace report {
+namespace morvik::report {
 
 /// Places are in points from the upper left corner; a picture is 1000 points wide. Colours are "#rrggbb".
 class Drawing {
@@ -45,6 +45,6 @@ private:
     std::vector<Words> itsWords;
 };
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

@@ -13,7 +13,7 @@
 #include "Wording.h"
 #include "base/OutputFile.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -353,4 +353,4 @@ void writeReport(const std::string& fileName, const std::vector<Curve>& curves, 
     base::writeFile(fileName, page.str());
 }
 
-}  // namespace report
+}  // namespace morvik::report

@@ -8,7 +8,7 @@
 
 #include "Curves.h"
 
-namespace report {
+namespace morvik::report {
 
 /// What the report says besides the curves. All texts are plain, none is taken as HTML.
 struct RunDescription {
@@ -24,6 +24,6 @@ void checkReport(const std::string& fileName);
 /// appears complete or not at all. Throws std::runtime_error.
 void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

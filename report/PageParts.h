@@ -2,11 +2,11 @@
 #ifndef MORVIK_REPORT_PAGEPARTS_H
 #define MORVIK_REPORT_PAGEPARTS_H
 
-namespace report {
+namespace morvik::report {
 
 extern const char pageStyle[];
 extern const char pageScript[];
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

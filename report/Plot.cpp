@@ -12,7 +12,7 @@
 #include "Wording.h"
 #include "base/OutputFile.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -129,4 +129,4 @@ void writeDrawing(const std::string& fileName, const Drawing& drawing)
     base::writeFile(fileName, picture);
 }
 
-}  // namespace report
+}  // namespace morvik::report

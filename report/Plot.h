@@ -8,7 +8,7 @@
 #include "Curves.h"
 #include "Drawing.h"
 
-namespace report {
+namespace morvik::report {
 
 /// Throws std::runtime_error, saying why, unless writePlot can be expected to work: the file's suffix is .svg, .png or
 /// .pdf, its folder can be written to, and a gnuplot is installed that draws this format.
@@ -21,6 +21,6 @@ void writePlot(const std::string& fileName, const std::vector<Curve>& curves, co
 /// The same for a picture of shapes.
 void writeDrawing(const std::string& fileName, const Drawing& drawing);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

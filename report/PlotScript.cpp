@@ -9,7 +9,7 @@
 #include "Series.h"
 #include "Wording.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -473,4 +473,4 @@ std::string plotScript(const std::string& suffix, const std::vector<Curve>& curv
     return openingCommands(suffix, script.height()) + script.text();
 }
 
-}  // namespace report
+}  // namespace morvik::report

@@ -7,7 +7,7 @@
 
 #include "Curves.h"
 
-namespace report {
+namespace morvik::report {
 
 /// The command that chooses a format and its size; no size while it is only asked whether gnuplot has the format. The
 /// suffix is .svg, .png or .pdf.
@@ -28,6 +28,6 @@ std::string quoted(const std::string& text);
 /// titles come in as strings that gnuplot does not interpret.
 std::string plotScript(const std::string& suffix, const std::vector<Curve>& curves, const std::string& title);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

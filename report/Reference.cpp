@@ -16,7 +16,7 @@
 #include "simulation/ResultFiles.h"
 #include "simulation/TextFile.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -257,4 +257,4 @@ std::vector<Curve> readReference(const std::string& fileName)
     return ReferenceReader(fileName).read();
 }
 
-}  // namespace report
+}  // namespace morvik::report

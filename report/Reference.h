@@ -7,7 +7,7 @@
 
 #include "Curves.h"
 
-namespace report {
+namespace morvik::report {
 
 /// Reads published error rates or results of `morvik ber`, both CSV with comment lines that begin with #; results as
 /// JSON, too, if the name ends in .json.
@@ -21,6 +21,6 @@ namespace report {
 /// Throws std::runtime_error with one line that begins with the place, FILE or FILE:LINE.
 std::vector<Curve> readReference(const std::string& fileName);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

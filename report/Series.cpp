@@ -6,7 +6,7 @@
 #include <cmath>
 #include <iterator>
 
-namespace report {
+namespace morvik::report {
 
 bool Rate::canBeDrawn() const
 {
@@ -179,4 +179,4 @@ std::vector<Curve> inOrder(const std::vector<Curve>& curves)
     return ordered;
 }
 
-}  // namespace report
+}  // namespace morvik::report

@@ -8,7 +8,7 @@
 
 #include "Curves.h"
 
-namespace report {
+namespace morvik::report {
 
 /// One of the two rates of a sample.
 struct Rate {
@@ -88,6 +88,6 @@ Look lookOf(const std::vector<Curve>& curves, std::size_t curve, const Axis& axi
 /// The curves with the references behind the others.
 std::vector<Curve> inOrder(const std::vector<Curve>& curves);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

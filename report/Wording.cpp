@@ -8,7 +8,7 @@
 
 #include "base/Printable.h"
 
-namespace report {
+namespace morvik::report {
 
 namespace {
 
@@ -122,4 +122,4 @@ std::string exact(double value)
     return {buffer.data(), result.ptr};
 }
 
-}  // namespace report
+}  // namespace morvik::report

@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-namespace report {
+namespace morvik::report {
 
 /// The text as valid UTF-8 on one line: a blank in the place of each control character, and ? for each byte that
 /// makes no character.
@@ -33,6 +33,6 @@ std::string grouped(std::uint64_t count);
 /// All the digits that a program needs; the value is finite.
 std::string exact(double value);
 
-}  // namespace report
+}  // namespace morvik::report
 
 #endif

@@ -8,9 +8,9 @@ ROOT = pathlib.Path(__file__).resolve().parent.parent
 
 # Where mistakes are made: files, and of them all or the named functions alone.
 PLACES = {
-    "src/Arithmetic.h": None,
-    "src/Trellis.h": None,
-    "src/TrellisDecision.h": None,
+    "rules/Arithmetic.h": None,
+    "rules/Trellis.h": None,
+    "rules/TrellisDecision.h": None,
     "src/Segmentation.cpp": None,
     "src/TCalculationEngineModBase.cpp": ["lutEntry", "forward", "backward", "ratios", "mod_gamma", "createLUT"],
     "src/TDecoder3G.cpp": ["intrinsicValue", "scaled", "extract", "appendParity", "interleaveSystematic",
@@ -37,7 +37,7 @@ PLACES = {
     "lanes/Rules.h": None,
     "lanes/Transpose.h": None,
     "lanes/Words.h": None,
-    "standard/BlockSizes.h": ["findBlockSize"],
+    "rules/BlockSizes.h": ["findBlockSize"],
 }
 
 # What is put in the place of what: operators with a space on both sides or at the end of their line, and words.
@@ -50,11 +50,11 @@ WORDS = [("add", "subtract"), ("subtract", "add"), ("addWrap", "subWrap"), ("sub
 
 # Mutants that change nothing that can be seen: of each file why, and the old and new line of each, cut to what matters.
 EQUIVALENT = {
-    "src/Arithmetic.h": [
+    "rules/Arithmetic.h": [
         ("a value that equals the limit becomes the limit",
          [("value < lo ?", "value <= lo ?"), ("hi < value ?", "hi <= value ?")]),
     ],
-    "src/Trellis.h": [
+    "rules/Trellis.h": [
         ("every bit that is not 0 is bit 1",
          [("predecessor(state, 1)", "predecessor(state, 2)"), ("bestPath<1>", "bestPath<2>"),
           ("successor(even, 1)", "successor(even, 2)"), ("successor(odd, 1)", "successor(odd, 2)")]),

@@ -10,7 +10,7 @@
 #include "Possible.h"
 #include "base/Json.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -142,4 +142,4 @@ std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::st
     return checkpoint;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

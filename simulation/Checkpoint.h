@@ -8,7 +8,7 @@
 
 #include "Plan.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 struct Checkpoint {
     std::string version;  // of the plan, as is the command
@@ -28,6 +28,6 @@ std::string checkpointText(const Checkpoint& checkpoint);
 /// when the checksum is right, but the rest is no checkpoint.
 std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::string& fileName);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -10,9 +10,9 @@
 
 #include "Possible.h"
 #include "Thousandths.h"
-#include "standard/BlockSizes.h"
+#include "rules/BlockSizes.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -185,4 +185,4 @@ const std::vector<Column>& columns()
     return allColumns;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

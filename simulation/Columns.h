@@ -8,7 +8,7 @@
 
 #include "Results.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// A column. JSON distinguishes numbers, texts, and lists of integers, which have spaces between them here.
 struct Column {
@@ -26,6 +26,6 @@ bool isVersion(std::string_view version);
 /// All columns, in their order. Rates and bounds are written for the reader's sake; reading computes them anew.
 const std::vector<Column>& columns();
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

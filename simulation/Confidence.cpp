@@ -6,7 +6,7 @@
 #include <boost/math/distributions/students_t.hpp>
 #include <boost/math/special_functions/beta.hpp>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -57,4 +57,4 @@ Bounds bitErrorBounds(const ErrorCounts& errors, std::uint64_t blocks, unsigned 
     return clopperPearson(rate * bits, bits);
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -6,7 +6,7 @@
 
 #include "Tally.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// A confidence interval of 95 %. Where the rate seen is 0 or 1 it is one-sided: "below `high`", "above `low`".
 struct Bounds {
@@ -29,6 +29,6 @@ Bounds blockErrorBounds(const ErrorCounts& errors, std::uint64_t blocks);
 /// correction for the variance being estimated from few blocks.
 Bounds bitErrorBounds(const ErrorCounts& errors, std::uint64_t blocks, unsigned blockSize);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

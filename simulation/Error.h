@@ -4,11 +4,11 @@
 
 #include "base/Error.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 using base::Error;
 using base::fileError;
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

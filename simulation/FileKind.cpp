@@ -3,7 +3,7 @@
 
 #include <array>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -40,4 +40,4 @@ const char* whyNoText(std::string_view beginning)
     return nullptr;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -4,13 +4,13 @@
 
 #include <string_view>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// What stands behind "FILE: " in the message about a file that begins so: that it is compressed, or a waveform in
 /// another format than VCD, or not in UTF-8, and how to make a text of it. Null when it may be a text. The first line,
 /// with or without its end, is enough.
 const char* whyNoText(std::string_view beginning);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

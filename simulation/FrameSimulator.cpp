@@ -8,7 +8,7 @@
 
 #include "Thousandths.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -154,4 +154,4 @@ void FrameSimulator::countWrongBitsOfEachIteration(const Point& point, std::uint
                                                               std::size_t{count} * point.iterations));
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -13,7 +13,7 @@
 #include "link/FrameSource.h"
 #include "morvik_v1_0_batch.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Makes the frames of a plan's points and decodes them. Belongs to one thread.
 class FrameSimulator {
@@ -54,6 +54,6 @@ private:
     std::vector<std::uint8_t> itsDecided;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

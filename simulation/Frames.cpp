@@ -8,7 +8,7 @@
 #include <system_error>
 #include <utility>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -125,4 +125,4 @@ std::optional<FrameSet> FrameSet::parse(std::string_view text)
     return frames;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// The frames from `from` up to, but without, `to`.
 struct FrameRange {
@@ -52,6 +52,6 @@ private:
     std::vector<FrameRange> itsRanges;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -14,7 +14,7 @@
 #include "base/OutputFile.h"
 #include "base/Shown.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -153,4 +153,4 @@ void Journal::forgetBegun(std::size_t last)
                 }));
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -11,7 +11,7 @@
 #include "OwnFile.h"
 #include "Plan.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Keeps the results of the ended points in a file, and beside it, until the run is complete, a checkpoint. Both are
 /// there as a whole whenever the process is killed, as they were saved last. All functions throw Error.
@@ -62,6 +62,6 @@ private:
     std::size_t itsResultsSaved = 0;  // how many points the results had when they were written last
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -10,7 +10,7 @@
 #include "Possible.h"
 #include "Thousandths.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -145,4 +145,4 @@ Results merge(const std::vector<Part>& parts)
     return results;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

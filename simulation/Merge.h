@@ -7,7 +7,7 @@
 
 #include "Results.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// The results of a file.
 struct Part {
@@ -20,6 +20,6 @@ struct Part {
 /// otherwise. Throws Error when parts have frames in common, or differ in what all results of a run share.
 Results merge(const std::vector<Part>& parts);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -10,7 +10,7 @@
 #include "Error.h"
 #include "Packing.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -192,4 +192,4 @@ bool dismissOthers(const MpiWorld& world, std::chrono::milliseconds patience)
     return others == 0;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -12,7 +12,7 @@
 #include "ThreadWorkers.h"
 #include "Workers.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// What rank 0 needs: threads of its own, which simulate, too, and all other ranks, which have as many each. The
 /// thread that calls it waits most of the time, and is the one that talks to the other ranks.
@@ -46,6 +46,6 @@ void workForRankZero(const Plan* plan, unsigned threads, const std::string& inst
 /// Rank 0 ends the work of the others. Returns whether all of them have answered in time.
 bool dismissOthers(const MpiWorld& world, std::chrono::milliseconds patience);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -5,7 +5,7 @@
 
 #include <array>
 
-namespace simulation {
+namespace morvik::simulation {
 
 // What MPI's functions return needs no look: by default a failure in any of them ends the job.
 
@@ -78,4 +78,4 @@ void MpiWorld::abandon()
     itsIsAbandoned = true;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

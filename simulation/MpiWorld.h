@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// What is said between rank 0 and another.
 enum class MpiMessageKind : int {
@@ -61,6 +61,6 @@ private:
     bool itsIsAbandoned = false;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -9,7 +9,7 @@
 #include "Error.h"
 #include "base/OutputFile.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -69,4 +69,4 @@ void OwnFile::remove()
     }
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -6,7 +6,7 @@
 
 #include "base/Descriptor.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Has a file, from before it is there until it is removed or the process ends. The file itself is what is locked, so
 /// that there is no other that a killed process could leave. A new one is empty until it is written, and goes with the
@@ -38,6 +38,6 @@ private:
     bool itsIsTaken = false;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

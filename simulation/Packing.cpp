@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <stdexcept>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -141,4 +141,4 @@ BatchResult unpackedResult(std::string_view bytes)
     return result;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -7,7 +7,7 @@
 
 #include "Workers.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 std::string packed(const FrameBatch& batch);
 
@@ -18,6 +18,6 @@ std::string packed(const BatchResult& result);
 FrameBatch unpackedBatch(std::string_view bytes);
 BatchResult unpackedResult(std::string_view bytes);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

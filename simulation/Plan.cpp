@@ -14,7 +14,7 @@
 #include "base/Shown.h"
 #include "link/DefaultScale.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -226,4 +226,4 @@ Results resultsOf(const Plan& plan, const std::vector<PointResult>& points)
     return results;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -14,7 +14,7 @@
 #include "StopRules.h"
 #include "Tally.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Values for each parameter, every combination of which is a point.
 struct Sweep {
@@ -81,6 +81,6 @@ std::size_t nextPoint(const Plan& plan, const std::vector<PointResult>& earlier)
 /// The rows of all points.
 Results resultsOf(const Plan& plan, const std::vector<PointResult>& points);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -6,7 +6,7 @@
 
 #include "Thousandths.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -59,4 +59,4 @@ std::string scaleOptionText(const ScaleOption& option)
     return option ? thousandthsText(*option) : "auto";
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

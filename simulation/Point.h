@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Soft-value steps for amplitude 1, as they are asked for: a number of thousandths, or nothing for the scale that
 /// suits the algorithm and Eb/N0.
@@ -41,6 +41,6 @@ std::optional<unsigned> algorithmOf(std::string_view nameOrNumber);
 /// "auto" or the number.
 std::string scaleOptionText(const ScaleOption& option);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -3,7 +3,7 @@
 
 #include <utility>
 
-namespace simulation {
+namespace morvik::simulation {
 
 PointCount::PointCount(const StopRules& rules, FrameRange frames, Tally tally)
     : itsRules(rules),
@@ -48,4 +48,4 @@ void PointCount::countInOrder(const BatchResult& result)
     }
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

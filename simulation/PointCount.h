@@ -10,7 +10,7 @@
 #include "Tally.h"
 #include "Workers.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Counts frames until a rule ends the point or the frames do. Results of later frames wait for those before them.
 class PointCount {
@@ -36,6 +36,6 @@ private:
     bool itsIsComplete;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -5,7 +5,7 @@
 #include <functional>
 #include <vector>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -60,4 +60,4 @@ bool isPossibleTime(double seconds)
     return seconds >= 0 && seconds <= longest;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -9,7 +9,7 @@
 #include "Frames.h"
 #include "Tally.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Years of work, and so few that rates and bounds can be computed: products with the bits of a block stay within 64
 /// bits.
@@ -25,6 +25,6 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
 /// Whether a run can have taken so long.
 bool isPossibleTime(double seconds);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -4,7 +4,7 @@
 
 #include "Plan.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Is told how a run goes on. Whatever it throws ends the run.
 class Progress {
@@ -21,6 +21,6 @@ public:
     virtual void hasEnded(const PointResult& point) = 0;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

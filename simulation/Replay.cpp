@@ -3,7 +3,7 @@
 
 #include "FrameSimulator.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 ReplayedTexts replay(const Plan& plan, std::size_t point, std::uint64_t frame, const std::string& instructionSet)
 {
@@ -29,4 +29,4 @@ ReplayedTexts replay(const Plan& plan, std::size_t point, std::uint64_t frame, c
     return texts;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

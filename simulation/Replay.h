@@ -8,7 +8,7 @@
 
 #include "Plan.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// A frame as texts in the formats of `morvik decode`.
 struct ReplayedTexts {
@@ -20,6 +20,6 @@ struct ReplayedTexts {
 /// Makes the frame of the point and decodes it. For the instruction set, see FrameSimulator.
 ReplayedTexts replay(const Plan& plan, std::size_t point, std::uint64_t frame, const std::string& instructionSet);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

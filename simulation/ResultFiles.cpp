@@ -15,7 +15,7 @@
 #include "base/Json.h"
 #include "base/OutputFile.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -211,4 +211,4 @@ Results parseResults(const std::string& text, const std::string& fileName)
     return format == ResultFormat::csv ? parseCsv(text, fileName) : parseJson(text, fileName);
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -6,7 +6,7 @@
 
 #include "Results.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 enum class ResultFormat { csv, json };
 
@@ -26,6 +26,6 @@ Results readResults(const std::string& fileName);
 /// Reads the content of such a file.
 Results parseResults(const std::string& text, const std::string& fileName);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

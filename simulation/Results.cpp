@@ -1,7 +1,7 @@
 // Results: rows of result files, one for each point, and for each count of iterations that was looked at there.
 #include "Results.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -37,4 +37,4 @@ Bounds blockErrorBounds(const ResultRow& row)
     return blockErrorBounds(row.errors, row.frames.size());
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -12,7 +12,7 @@
 #include "Point.h"
 #include "Tally.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// A row. Rates and bounds follow from its counts.
 struct ResultRow {
@@ -42,6 +42,6 @@ double clippedFraction(const ResultRow& row);
 Bounds bitErrorBounds(const ResultRow& row);
 Bounds blockErrorBounds(const ResultRow& row);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

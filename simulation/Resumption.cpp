@@ -11,7 +11,7 @@
 #include "ResultFiles.h"
 #include "base/Json.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -219,4 +219,4 @@ Standing standingOf(const Plan& plan, const Results& results, const std::string&
     return parted(plan, *points);
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

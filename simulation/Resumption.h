@@ -8,7 +8,7 @@
 #include "Checkpoint.h"
 #include "Plan.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Where a run starts, so that it ends with the counts of a run from the beginning.
 struct Standing {
@@ -26,6 +26,6 @@ Standing standingOf(const Plan& plan, const Checkpoint& checkpoint, const std::s
 /// another run, or of a part of one.
 Standing standingOf(const Plan& plan, const Results& results, const std::string& fileName);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

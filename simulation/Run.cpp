@@ -9,7 +9,7 @@
 
 #include "PointCount.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -175,4 +175,4 @@ bool run(const Plan& plan, const RunParts& parts)
     return true;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -9,7 +9,7 @@
 #include "Progress.h"
 #include "Workers.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// What a run is made with.
 struct RunParts {
@@ -24,6 +24,6 @@ struct RunParts {
 /// complete: false after an interruption, which leaves a checkpoint of all that has been counted.
 bool run(const Plan& plan, const RunParts& parts);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -4,10 +4,10 @@
 
 #include "base/Shown.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 using base::shown;
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

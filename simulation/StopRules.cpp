@@ -3,7 +3,7 @@
 
 #include <algorithm>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -38,4 +38,4 @@ double progressOf(const StopRules& rules, std::uint64_t blocks, const ErrorCount
                      rules.maxSeconds ? share(seconds, *rules.maxSeconds) : 0.0});
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -7,7 +7,7 @@
 
 #include "Tally.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// A point ends after the first frame, in the order of their numbers, with which one of its limits is reached. All
 /// but the time depend on the frames alone, so that the same frames count whatever is computed at the same time.
@@ -25,6 +25,6 @@ bool isReached(const StopRules& rules, std::uint64_t blocks, const ErrorCounts& 
 /// How much of the way to the nearest limit is done, 0 to 1.
 double progressOf(const StopRules& rules, std::uint64_t blocks, const ErrorCounts& errors, double seconds);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -3,7 +3,7 @@
 
 #include <algorithm>
 
-namespace simulation {
+namespace morvik::simulation {
 
 void ErrorCounts::add(std::uint64_t frame, std::uint32_t wrongBits)
 {
@@ -28,4 +28,4 @@ void ErrorCounts::add(const ErrorCounts& other)
     failures.resize(std::min(failures.size(), keptFailures));
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

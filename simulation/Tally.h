@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <vector>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// The wrong decisions of any number of frames, at one count of iterations.
 struct ErrorCounts {
@@ -36,6 +36,6 @@ struct Tally {
     explicit Tally(std::size_t counts = 1) : errors(counts) {}
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -11,7 +11,7 @@
 #include "FileKind.h"
 #include "base/Csv.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 std::string readText(const std::string& fileName)
 {
@@ -58,4 +58,4 @@ void expectRegularFile(const std::string& fileName)
     }
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

@@ -6,7 +6,7 @@
 #include <istream>
 #include <string>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// As much as can be read: more than any file of results has.
 constexpr std::size_t largestText = std::size_t{1} << 28;
@@ -21,6 +21,6 @@ void expectRegularFile(const std::string& fileName);
 /// What readText(fileName) gives of an open file, which messages call `name`, of at most so many bytes.
 std::string readText(std::istream& file, const std::string& name, std::size_t largest);
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

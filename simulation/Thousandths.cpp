@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <cstdlib>
 
-namespace simulation {
+namespace morvik::simulation {
 
 namespace {
 
@@ -53,4 +53,4 @@ std::string thousandthsText(int thousandths)
     return (thousandths < 0 ? "-" : "") + std::to_string(size / 1000) + (fraction.empty() ? "" : '.' + fraction);
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

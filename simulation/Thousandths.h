@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// The number that the whole text writes in decimal, times 1000; nothing if it has more than three decimals, or
 /// more than six digits before them, or is no such number at all.
@@ -21,6 +21,6 @@ inline double fromThousandths(int thousandths)
     return thousandths / 1000.0;
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -10,7 +10,7 @@
 #include "Error.h"
 #include "FrameSimulator.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 ThreadWorkers::ThreadWorkers(const Plan& plan, unsigned threads, const std::string& instructionSet)
 {
@@ -117,4 +117,4 @@ void ThreadWorkers::simulateUntilEnd(FrameSimulator& simulator)
     }
 }
 
-}  // namespace simulation
+}  // namespace morvik::simulation

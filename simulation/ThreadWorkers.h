@@ -13,7 +13,7 @@
 #include "Plan.h"
 #include "Workers.h"
 
-namespace simulation {
+namespace morvik::simulation {
 
 class FrameSimulator;
 
@@ -47,6 +47,6 @@ private:
     std::vector<std::thread> itsThreads;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

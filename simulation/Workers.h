@@ -8,7 +8,7 @@
 #include <optional>
 #include <vector>
 
-namespace simulation {
+namespace morvik::simulation {
 
 /// Neighbouring frames of a point of the plan.
 struct FrameBatch {
@@ -48,6 +48,6 @@ public:
     virtual void forgetAll() = 0;
 };
 
-}  // namespace simulation
+}  // namespace morvik::simulation
 
 #endif

@@ -1,6 +1,6 @@
 // Components: the six components of a state, made from its generics, and whether somebody has changed them since.
-#ifndef MORVIK_COMPONENTS_H
-#define MORVIK_COMPONENTS_H
+#ifndef MORVIK_SRC_COMPONENTS_H
+#define MORVIK_SRC_COMPONENTS_H
 
 #include <cstdint>
 #include <vector>

@@ -1,6 +1,6 @@
 // DecoderState: the record behind the opaque pointer of the C interface.
-#ifndef MORVIK_DECODERSTATE_H
-#define MORVIK_DECODERSTATE_H
+#ifndef MORVIK_SRC_DECODERSTATE_H
+#define MORVIK_SRC_DECODERSTATE_H
 
 #include <cstdint>
 

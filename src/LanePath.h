@@ -1,15 +1,15 @@
 // LanePath: the C interface's quick way through the lane-parallel decoder, beside the components.
-#ifndef MORVIK_LANEPATH_H
-#define MORVIK_LANEPATH_H
+#ifndef MORVIK_SRC_LANEPATH_H
+#define MORVIK_SRC_LANEPATH_H
 
 #include <cstdint>
 #include <memory>
 #include <vector>
 
-#include "../lanes/InstructionSets.h"
-#include "../lanes/LaneDecoder.h"
 #include "Components.h"
 #include "TDecoder3GPU.h"
+#include "lanes/InstructionSets.h"
+#include "lanes/LaneDecoder.h"
 
 /// Decodes for a decoder whose metric columns nobody watches, and keeps its counters. The columns are not
 /// computed here, but a trace shows what earlier blocks left in some of them; before the components work

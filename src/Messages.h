@@ -3,8 +3,8 @@
 // Every message is one line, written at once and flushed. Parts are put together as characters, never
 // with formatted insertion, so that a host program's stream flags (std::hex, a field width) and
 // locale cannot change a line, and so that a message needs no memory from the heap.
-#ifndef MORVIK_MESSAGES_H
-#define MORVIK_MESSAGES_H
+#ifndef MORVIK_SRC_MESSAGES_H
+#define MORVIK_SRC_MESSAGES_H
 
 #include <charconv>
 #include <cstddef>

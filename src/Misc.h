@@ -7,8 +7,8 @@
 //
 // None of the functions throws for the content of what it is given; exhausted memory surfaces as
 // std::bad_alloc or std::length_error.
-#ifndef MORVIK_MISC_H
-#define MORVIK_MISC_H
+#ifndef MORVIK_SRC_MISC_H
+#define MORVIK_SRC_MISC_H
 
 #include <cstdint>
 #include <istream>

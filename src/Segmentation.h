@@ -1,6 +1,6 @@
 // Segmentation: how a block is cut into segments, and a segment into windows.
-#ifndef MORVIK_SEGMENTATION_H
-#define MORVIK_SEGMENTATION_H
+#ifndef MORVIK_SRC_SEGMENTATION_H
+#define MORVIK_SRC_SEGMENTATION_H
 
 #include <cstdint>
 #include <vector>

@@ -3,10 +3,10 @@
 
 #include <array>
 
-#include "../lanes/Unaligned.h"
-#include "Arithmetic.h"
 #include "LanePath.h"
 #include "Messages.h"
+#include "lanes/Unaligned.h"
+#include "rules/Arithmetic.h"
 
 namespace simulation_call {
 

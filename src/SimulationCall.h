@@ -1,13 +1,13 @@
 // SimulationCall: what the simulation calls of the two C headers share.
-#ifndef MORVIK_SIMULATIONCALL_H
-#define MORVIK_SIMULATIONCALL_H
+#ifndef MORVIK_SRC_SIMULATIONCALL_H
+#define MORVIK_SRC_SIMULATIONCALL_H
 
 #include <cstddef>
 #include <cstdint>
 #include <vector>
 
-#include "../lanes/LaneDecoder.h"
 #include "DecoderState.h"
+#include "lanes/LaneDecoder.h"
 
 namespace simulation_call {
 

@@ -1,6 +1,6 @@
 // T8: one trellis column, eight 16-bit metrics.
-#ifndef MORVIK_T8_H
-#define MORVIK_T8_H
+#ifndef MORVIK_SRC_T8_H
+#define MORVIK_SRC_T8_H
 
 /// One column of the trellis: element s belongs to trellis state s, 0 to 7. A column of branch
 /// metrics uses the elements 0 to 3 and leaves 4 to 7 as they were. Arrays of columns are

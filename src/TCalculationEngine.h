@@ -1,6 +1,6 @@
 // TCalculationEngine: the family of trellis calculation engines and its factory.
-#ifndef MORVIK_TCALCULATIONENGINE_H
-#define MORVIK_TCALCULATIONENGINE_H
+#ifndef MORVIK_SRC_TCALCULATIONENGINE_H
+#define MORVIK_SRC_TCALCULATIONENGINE_H
 
 #include <string>
 #include <vector>

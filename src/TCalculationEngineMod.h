@@ -1,6 +1,6 @@
 // TCalculationEngineMod: the engine "MOD", max-log-MAP without correction.
-#ifndef MORVIK_TCALCULATIONENGINEMOD_H
-#define MORVIK_TCALCULATIONENGINEMOD_H
+#ifndef MORVIK_SRC_TCALCULATIONENGINEMOD_H
+#define MORVIK_SRC_TCALCULATIONENGINEMOD_H
 
 #include <string>
 

@@ -7,11 +7,11 @@
 #include <istream>
 #include <ostream>
 
-#include "Arithmetic.h"
 #include "Messages.h"
 #include "TraceTable.h"
-#include "Trellis.h"
-#include "TrellisDecision.h"
+#include "rules/Arithmetic.h"
+#include "rules/Trellis.h"
+#include "rules/TrellisDecision.h"
 
 namespace {
 

@@ -1,6 +1,6 @@
 // TCalculationEngineModBase: the trellis kernels in their three variants, and the correction table.
-#ifndef MORVIK_TCALCULATIONENGINEMODBASE_H
-#define MORVIK_TCALCULATIONENGINEMODBASE_H
+#ifndef MORVIK_SRC_TCALCULATIONENGINEMODBASE_H
+#define MORVIK_SRC_TCALCULATIONENGINEMODBASE_H
 
 #include <cstdint>
 #include <iosfwd>

@@ -1,6 +1,6 @@
 // TCalculationEngineModHash: the engine "MOD#", max-log-MAP with a correction one stage late.
-#ifndef MORVIK_TCALCULATIONENGINEMODHASH_H
-#define MORVIK_TCALCULATIONENGINEMODHASH_H
+#ifndef MORVIK_SRC_TCALCULATIONENGINEMODHASH_H
+#define MORVIK_SRC_TCALCULATIONENGINEMODHASH_H
 
 #include <string>
 #include <vector>

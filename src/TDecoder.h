@@ -1,6 +1,6 @@
 // TDecoder: the family of turbo decoders, what they all store, and their factory.
-#ifndef MORVIK_TDECODER_H
-#define MORVIK_TDECODER_H
+#ifndef MORVIK_SRC_TDECODER_H
+#define MORVIK_SRC_TDECODER_H
 
 #include <cstdint>
 #include <iosfwd>

@@ -4,9 +4,9 @@
 #include <algorithm>
 #include <cstddef>
 
-#include "Arithmetic.h"
 #include "Messages.h"
 #include "TraceTable.h"
+#include "rules/Arithmetic.h"
 
 using arithmetic::shiftRight;
 using arithmetic::wrap16;

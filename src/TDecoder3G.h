@@ -1,6 +1,6 @@
 // TDecoder3G: the turbo decoder over the whole trellis with one engine.
-#ifndef MORVIK_TDECODER3G_H
-#define MORVIK_TDECODER3G_H
+#ifndef MORVIK_SRC_TDECODER3G_H
+#define MORVIK_SRC_TDECODER3G_H
 
 #include <array>
 #include <string>

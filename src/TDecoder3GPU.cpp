@@ -6,10 +6,10 @@
 #include <sstream>
 #include <utility>
 
-#include "Arithmetic.h"
 #include "Messages.h"
 #include "Segmentation.h"
-#include "Trellis.h"
+#include "rules/Arithmetic.h"
+#include "rules/Trellis.h"
 
 namespace {
 

@@ -1,6 +1,6 @@
 // TDecoder3GPU: the turbo decoder split over parallel processing units.
-#ifndef MORVIK_TDECODER3GPU_H
-#define MORVIK_TDECODER3GPU_H
+#ifndef MORVIK_SRC_TDECODER3GPU_H
+#define MORVIK_SRC_TDECODER3GPU_H
 
 #include <array>
 #include <cstddef>

@@ -1,6 +1,6 @@
 // TInterleaver: the family of interleavers, its permutation tables and its factory.
-#ifndef MORVIK_TINTERLEAVER_H
-#define MORVIK_TINTERLEAVER_H
+#ifndef MORVIK_SRC_TINTERLEAVER_H
+#define MORVIK_SRC_TINTERLEAVER_H
 
 #include <string>
 #include <vector>

@@ -3,8 +3,8 @@
 
 #include <cstdint>
 
-#include "../standard/BlockSizes.h"
 #include "Messages.h"
+#include "rules/BlockSizes.h"
 
 TInterleaver* TInterleaver3GPPLTE::create(const std::string& props)
 {

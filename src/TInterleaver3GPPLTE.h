@@ -1,6 +1,6 @@
 // TInterleaver3GPPLTE: the quadratic permutation polynomial interleaver of LTE.
-#ifndef MORVIK_TINTERLEAVER3GPPLTE_H
-#define MORVIK_TINTERLEAVER3GPPLTE_H
+#ifndef MORVIK_SRC_TINTERLEAVER3GPPLTE_H
+#define MORVIK_SRC_TINTERLEAVER3GPPLTE_H
 
 #include "TInterleaver.h"
 

@@ -5,9 +5,9 @@
 #include <ostream>
 #include <sstream>
 
-#include "Arithmetic.h"
 #include "Messages.h"
 #include "Misc.h"
+#include "rules/Arithmetic.h"
 
 using arithmetic::shiftLeftWrap;
 using arithmetic::shiftRight;

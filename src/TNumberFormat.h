@@ -1,6 +1,6 @@
 // TNumberFormat: a signed fixed-point format and its derived limits.
-#ifndef MORVIK_TNUMBERFORMAT_H
-#define MORVIK_TNUMBERFORMAT_H
+#ifndef MORVIK_SRC_TNUMBERFORMAT_H
+#define MORVIK_SRC_TNUMBERFORMAT_H
 
 #include <cstdint>
 #include <iosfwd>

@@ -1,6 +1,6 @@
 // TraceTable: rows of a trace, one for each trellis step.
-#ifndef MORVIK_TRACETABLE_H
-#define MORVIK_TRACETABLE_H
+#ifndef MORVIK_SRC_TRACETABLE_H
+#define MORVIK_SRC_TRACETABLE_H
 
 #include <sstream>
 

@@ -7,11 +7,11 @@
 #include <string_view>
 #include <vector>
 
-#include "../lanes/Unaligned.h"
 #include "LanePath.h"
 #include "Messages.h"
 #include "SimulationCall.h"
 #include "TDecoder.h"
+#include "lanes/Unaligned.h"
 
 namespace {
 

@@ -89,7 +89,7 @@ def read_rows(path):
 
 
 def read_reference(path):
-    """The curve of a file of data/error_rates."""
+    """The curve of a file of validation/error_rates."""
     return [Point(float(row["ebn0_db"]), int(row["frames"]), int(row["frame_errors"])) for row in read_rows(path)]
 
 

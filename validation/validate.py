@@ -21,7 +21,7 @@ from plot import draw
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
 RESULTS = ROOT / "validation" / "results"
-REFERENCES = ROOT / "data" / "error_rates"
+REFERENCES = ROOT / "validation" / "error_rates"
 DOCUMENT = ROOT / "docs" / "validation.md"
 PLOT = ROOT / "docs" / "validation.svg"
 

@@ -16,12 +16,12 @@
 #include "Pictures.h"
 #include "Text.h"
 #include "base/OutputFile.h"
+#include "hardware/testbench/Decoder.h"
 #include "simulation/Error.h"
 #include "simulation/Journal.h"
 #include "simulation/Replay.h"
 #include "simulation/Run.h"
 #include "simulation/ThreadWorkers.h"
-#include "testbench/Decoder.h"
 
 namespace morvik {
 

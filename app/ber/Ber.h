@@ -1,6 +1,6 @@
 // Ber: the subcommand that simulates error rates.
-#ifndef MORVIK_BER_H
-#define MORVIK_BER_H
+#ifndef MORVIK_APP_BER_BER_H
+#define MORVIK_APP_BER_BER_H
 
 #include <functional>
 #include <memory>

@@ -1,6 +1,6 @@
 // BerOptions: the arguments of `morvik ber`.
-#ifndef MORVIK_BEROPTIONS_H
-#define MORVIK_BEROPTIONS_H
+#ifndef MORVIK_APP_BER_BEROPTIONS_H
+#define MORVIK_APP_BER_BEROPTIONS_H
 
 #include <CLI/CLI.hpp>
 #include <cstddef>

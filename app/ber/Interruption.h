@@ -1,6 +1,6 @@
 // Interruption: signals that ask the process to end, taken as a wish that is looked at now and then.
-#ifndef MORVIK_INTERRUPTION_H
-#define MORVIK_INTERRUPTION_H
+#ifndef MORVIK_APP_BER_INTERRUPTION_H
+#define MORVIK_APP_BER_INTERRUPTION_H
 
 namespace morvik {
 

@@ -1,6 +1,6 @@
 // LiveTable: a run's points as a table that grows, with a line for the running point on terminals.
-#ifndef MORVIK_LIVETABLE_H
-#define MORVIK_LIVETABLE_H
+#ifndef MORVIK_APP_BER_LIVETABLE_H
+#define MORVIK_APP_BER_LIVETABLE_H
 
 #include <chrono>
 #include <cstddef>

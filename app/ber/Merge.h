@@ -1,6 +1,6 @@
 // Merge: the subcommand that joins the results of several runs.
-#ifndef MORVIK_MERGE_H
-#define MORVIK_MERGE_H
+#ifndef MORVIK_APP_BER_MERGE_H
+#define MORVIK_APP_BER_MERGE_H
 
 #include "Command.h"
 

@@ -1,6 +1,6 @@
 // Pictures: what is drawn of results: those of a run, or joined ones.
-#ifndef MORVIK_PICTURES_H
-#define MORVIK_PICTURES_H
+#ifndef MORVIK_APP_BER_PICTURES_H
+#define MORVIK_APP_BER_PICTURES_H
 
 #include <CLI/CLI.hpp>
 #include <string>

@@ -12,12 +12,12 @@
 #include "Notice.h"
 #include "OtherRuns.h"
 #include "SoftValueReader.h"
-#include "comparison/Comparison.h"
-#include "comparison/Coverage.h"
-#include "comparison/Dump.h"
-#include "comparison/Model.h"
-#include "comparison/NameMap.h"
-#include "comparison/Report.h"
+#include "hardware/comparison/Comparison.h"
+#include "hardware/comparison/Coverage.h"
+#include "hardware/comparison/Dump.h"
+#include "hardware/comparison/Model.h"
+#include "hardware/comparison/NameMap.h"
+#include "hardware/comparison/Report.h"
 #include "simulation/Error.h"
 
 namespace morvik {

@@ -1,6 +1,6 @@
 // Compare: the subcommand that finds where a simulation of hardware leaves the model.
-#ifndef MORVIK_COMPARE_H
-#define MORVIK_COMPARE_H
+#ifndef MORVIK_APP_COMPARE_COMPARE_H
+#define MORVIK_APP_COMPARE_COMPARE_H
 
 #include "Command.h"
 

@@ -7,8 +7,8 @@
 
 #include "Files.h"
 #include "SoftValueReader.h"
-#include "comparison/Model.h"
-#include "doctor/Mistakes.h"
+#include "hardware/comparison/Model.h"
+#include "hardware/diagnosis/Mistakes.h"
 #include "simulation/Point.h"
 
 namespace morvik {

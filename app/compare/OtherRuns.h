@@ -1,14 +1,14 @@
 // OtherRuns: what the model would have to be given, so that it computes a dump that is not the one of its options.
-#ifndef MORVIK_OTHERRUNS_H
-#define MORVIK_OTHERRUNS_H
+#ifndef MORVIK_APP_COMPARE_OTHERRUNS_H
+#define MORVIK_APP_COMPARE_OTHERRUNS_H
 
 #include <cstdint>
 #include <string>
 #include <vector>
 
-#include "comparison/Values.h"
+#include "hardware/comparison/Values.h"
+#include "hardware/testbench/SoftBlock.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
-#include "testbench/SoftBlock.h"
 
 namespace morvik {
 

@@ -7,7 +7,7 @@
 #include "TDecoder3GPU.h"
 #include "TInterleaver.h"
 #include "TNumberFormat.h"
-#include "standard/BlockSizes.h"
+#include "rules/BlockSizes.h"
 
 namespace morvik {
 

@@ -1,12 +1,12 @@
 // BlockLayout: how the core works on a block of K bits, as the model's own components tell it.
-#ifndef MORVIK_BLOCKLAYOUT_H
-#define MORVIK_BLOCKLAYOUT_H
+#ifndef MORVIK_APP_INFO_BLOCKLAYOUT_H
+#define MORVIK_APP_INFO_BLOCKLAYOUT_H
 
 #include <cstdint>
 #include <string>
 #include <vector>
 
-#include "testbench/Division.h"
+#include "hardware/testbench/Division.h"
 
 namespace morvik {
 

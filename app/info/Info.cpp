@@ -16,8 +16,8 @@
 #include "LayoutPicture.h"
 #include "Notice.h"
 #include "report/Plot.h"
+#include "rules/BlockSizes.h"
 #include "simulation/Point.h"
-#include "standard/BlockSizes.h"
 
 namespace morvik {
 

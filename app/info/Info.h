@@ -1,6 +1,6 @@
 // Info: the subcommand that tells what the core makes of a block size.
-#ifndef MORVIK_INFO_H
-#define MORVIK_INFO_H
+#ifndef MORVIK_APP_INFO_INFO_H
+#define MORVIK_APP_INFO_INFO_H
 
 #include "Command.h"
 

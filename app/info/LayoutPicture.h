@@ -1,6 +1,6 @@
 // LayoutPicture: how a block is cut into segments and windows, and the order in which they are computed.
-#ifndef MORVIK_LAYOUTPICTURE_H
-#define MORVIK_LAYOUTPICTURE_H
+#ifndef MORVIK_APP_INFO_LAYOUTPICTURE_H
+#define MORVIK_APP_INFO_LAYOUTPICTURE_H
 
 #include <vector>
 

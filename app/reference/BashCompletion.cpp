@@ -4,7 +4,7 @@
 
 #include "Completion.h"
 
-namespace reference {
+namespace morvik::reference {
 
 namespace {
 
@@ -141,4 +141,4 @@ std::string bashCompletion(const CommandFacts& program)
            function + ' ' + program.name + '\n';
 }
 
-}  // namespace reference
+}  // namespace morvik::reference

@@ -6,7 +6,7 @@
 
 #include "Arguments.h"
 
-namespace reference {
+namespace morvik::reference {
 
 namespace {
 
@@ -99,4 +99,4 @@ CommandFacts factsOf(CLI::App& app)
     return factsOf(app, "");
 }
 
-}  // namespace reference
+}  // namespace morvik::reference

@@ -1,12 +1,12 @@
 // Facts: what there is to tell of a command's arguments, as plain data.
-#ifndef MORVIK_REFERENCE_FACTS_H
-#define MORVIK_REFERENCE_FACTS_H
+#ifndef MORVIK_APP_REFERENCE_FACTS_H
+#define MORVIK_APP_REFERENCE_FACTS_H
 
 #include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
 
-namespace reference {
+namespace morvik::reference {
 
 /// What an option's value names.
 enum class Files { none, any, folders };
@@ -40,6 +40,6 @@ struct CommandFacts {
 
 CommandFacts factsOf(CLI::App& app);
 
-}  // namespace reference
+}  // namespace morvik::reference
 
 #endif

@@ -6,7 +6,7 @@
 #include <sstream>
 #include <vector>
 
-namespace reference {
+namespace morvik::reference {
 
 namespace {
 
@@ -301,4 +301,4 @@ std::map<std::string, std::string> manualPages(const CommandFacts& program, cons
     return pages;
 }
 
-}  // namespace reference
+}  // namespace morvik::reference

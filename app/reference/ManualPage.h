@@ -1,13 +1,13 @@
 // ManualPage: the pages of a program for man(1).
-#ifndef MORVIK_REFERENCE_MANUALPAGE_H
-#define MORVIK_REFERENCE_MANUALPAGE_H
+#ifndef MORVIK_APP_REFERENCE_MANUALPAGE_H
+#define MORVIK_APP_REFERENCE_MANUALPAGE_H
 
 #include <map>
 #include <string>
 
 #include "Facts.h"
 
-namespace reference {
+namespace morvik::reference {
 
 /// The pages by the names of their files: one for the program and one for each subcommand. A program that has a single
 /// subcommand is told on one page.
@@ -16,6 +16,6 @@ namespace reference {
 /// paragraphs that begin with "Example:", become sections of their own.
 std::map<std::string, std::string> manualPages(const CommandFacts& program, const std::string& version);
 
-}  // namespace reference
+}  // namespace morvik::reference
 
 #endif

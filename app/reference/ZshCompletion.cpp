@@ -3,7 +3,7 @@
 
 #include "Completion.h"
 
-namespace reference {
+namespace morvik::reference {
 
 namespace {
 
@@ -136,4 +136,4 @@ std::string zshCompletion(const CommandFacts& program)
            " \"$@\"\n";
 }
 
-}  // namespace reference
+}  // namespace morvik::reference

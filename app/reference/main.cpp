@@ -24,7 +24,7 @@ void write(const fs::path& file, const std::string& text)
 
 void writeReference(const fs::path& folder, const morvik::Program& program)
 {
-    const reference::CommandFacts facts = reference::factsOf(*program.arguments);
+    const morvik::reference::CommandFacts facts = morvik::reference::factsOf(*program.arguments);
     const fs::path share = folder / facts.name / "share";
     fs::remove_all(folder / facts.name);  // pages of subcommands that are no more
     for (const auto& [name, page] : manualPages(facts, MORVIK_VERSION)) {

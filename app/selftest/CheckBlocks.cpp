@@ -5,7 +5,7 @@
 
 #include "link/FrameSource.h"
 #include "link/Random.h"
-#include "standard/BlockSizes.h"
+#include "rules/BlockSizes.h"
 
 namespace morvik::selftest {
 

@@ -1,6 +1,6 @@
 // CheckBlocks: the blocks that `morvik selftest` decodes, the same on every machine.
-#ifndef MORVIK_CHECKBLOCKS_H
-#define MORVIK_CHECKBLOCKS_H
+#ifndef MORVIK_APP_SELFTEST_CHECKBLOCKS_H
+#define MORVIK_APP_SELFTEST_CHECKBLOCKS_H
 
 #include <array>
 #include <cstdint>

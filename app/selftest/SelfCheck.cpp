@@ -8,8 +8,8 @@
 #include <ostream>
 #include <stdexcept>
 
+#include "hardware/testbench/Decoder.h"
 #include "morvik_v1_0_batch.h"
-#include "testbench/Decoder.h"
 
 namespace morvik::selftest {
 

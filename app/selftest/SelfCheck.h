@@ -1,6 +1,6 @@
 // SelfCheck: compares what this machine decodes with digests of what every machine has to decode.
-#ifndef MORVIK_SELFCHECK_H
-#define MORVIK_SELFCHECK_H
+#ifndef MORVIK_APP_SELFTEST_SELFCHECK_H
+#define MORVIK_APP_SELFTEST_SELFCHECK_H
 
 #include <array>
 #include <cstdint>

@@ -1,6 +1,6 @@
 // SelfTest: the subcommand that proves that library and processor give the promised bits.
-#ifndef MORVIK_SELFTEST_H
-#define MORVIK_SELFTEST_H
+#ifndef MORVIK_APP_SELFTEST_SELFTEST_H
+#define MORVIK_APP_SELFTEST_SELFTEST_H
 
 #include "Command.h"
 

@@ -6,7 +6,7 @@
 #include <utility>
 
 #include "bindings/Listener.h"
-#include "standard/BlockSizes.h"
+#include "rules/BlockSizes.h"
 
 namespace morvik::simulator {
 

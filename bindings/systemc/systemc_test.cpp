@@ -87,7 +87,7 @@ int sc_main(int argc, char* argv[])
     }
 
     std::ifstream file(argv[1]);
-    const auto cases = conformance::readCases(file);
+    const auto cases = morvik::conformance::readCases(file);
     std::vector<std::unique_ptr<Rig>> rigs;
     rigs.reserve(cases.size());
     for (const auto& each : cases) {

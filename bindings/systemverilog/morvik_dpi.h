@@ -4,8 +4,8 @@
  * A decoder is null after a failure to allocate it alone; generics that are refused leave one that is not open, whose
  * message tells why. Every function takes a null decoder, and does nothing with it.
  */
-#ifndef MORVIK_DPI_H
-#define MORVIK_DPI_H
+#ifndef MORVIK_BINDINGS_SYSTEMVERILOG_MORVIK_DPI_H
+#define MORVIK_BINDINGS_SYSTEMVERILOG_MORVIK_DPI_H
 
 #include "morvik_v1_0_bitacc_cmodel.h"
 

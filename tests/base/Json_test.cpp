@@ -10,22 +10,22 @@
 
 namespace {
 
-using base::Json;
-using base::JsonMembers;
+using morvik::base::Json;
+using morvik::base::JsonMembers;
 
 std::string refusalOf(const std::function<void()>& action)
 {
     try {
         action();
-    } catch (const base::Error& error) {
+    } catch (const morvik::base::Error& error) {
         return error.what();
     }
     return "none";
 }
 
-std::string refusal(const std::string& text, const base::JsonLimits& limits = {})
+std::string refusal(const std::string& text, const morvik::base::JsonLimits& limits = {})
 {
-    return refusalOf([&] { base::parseJson(text, "a.json", limits); });
+    return refusalOf([&] { morvik::base::parseJson(text, "a.json", limits); });
 }
 
 std::string nested(std::size_t levels)
@@ -36,7 +36,7 @@ std::string nested(std::size_t levels)
 TEST(Json, IsReadAsItStands)
 {
     const Json json =
-        base::parseJson(R"({"a": [1, 2.5, "x", null, true], "b": {"a": 18446744073709551615}})", "a.json");
+        morvik::base::parseJson(R"({"a": [1, 2.5, "x", null, true], "b": {"a": 18446744073709551615}})", "a.json");
     EXPECT_EQ(json["a"].size(), 5U);
     EXPECT_EQ(json["b"]["a"], UINT64_MAX);
 }
@@ -79,27 +79,27 @@ TEST(Json, OfMoreThanItsLimitsIsRefused)
 
 TEST(Json, IsShortInMessages)
 {
-    EXPECT_EQ(base::shownValue(Json(std::string(1000, 'x'))), '"' + std::string(40, 'x') + "...\"");
-    EXPECT_EQ(base::shownValue(Json("a\nb")), "\"a\\x0ab\"");
-    EXPECT_EQ(base::shownValue(Json::array({1, 2})), "a list");
-    EXPECT_EQ(base::shownValue(Json::object()), "an object");
-    EXPECT_EQ(base::shownValue(Json(1.5)), "1.5");
-    EXPECT_EQ(base::shownValue(Json()), "null");
+    EXPECT_EQ(morvik::base::shownValue(Json(std::string(1000, 'x'))), '"' + std::string(40, 'x') + "...\"");
+    EXPECT_EQ(morvik::base::shownValue(Json("a\nb")), "\"a\\x0ab\"");
+    EXPECT_EQ(morvik::base::shownValue(Json::array({1, 2})), "a list");
+    EXPECT_EQ(morvik::base::shownValue(Json::object()), "an object");
+    EXPECT_EQ(morvik::base::shownValue(Json(1.5)), "1.5");
+    EXPECT_EQ(morvik::base::shownValue(Json()), "null");
 }
 
 TEST(Json, HoldsBytesThatAreNoUtf8AsReplacements)
 {
-    EXPECT_EQ(base::jsonString("a\xff\"\n"), "\"a\xef\xbf\xbd\\\"\\n\"");
-    EXPECT_EQ(base::asUtf8("a\xff\"\n"), "a\xef\xbf\xbd\"\n");
-    EXPECT_EQ(base::asUtf8("K\xc3\xb6ln"), "K\xc3\xb6ln");
+    EXPECT_EQ(morvik::base::jsonString("a\xff\"\n"), "\"a\xef\xbf\xbd\\\"\\n\"");
+    EXPECT_EQ(morvik::base::asUtf8("a\xff\"\n"), "a\xef\xbf\xbd\"\n");
+    EXPECT_EQ(morvik::base::asUtf8("K\xc3\xb6ln"), "K\xc3\xb6ln");
 }
 
 TEST(Json, MembersAreWhatIsExpectedOfThem)
 {
     const Json json =
-        base::parseJson(R"({"n": 5, "x": 1.5, "t": "text", "f": true, "l": [], "big": 18446744073709551616,
+        morvik::base::parseJson(R"({"n": 5, "x": 1.5, "t": "text", "f": true, "l": [], "big": 18446744073709551616,
         "negative": -1})",
-                        "a.json");
+                                "a.json");
     const JsonMembers members(json, "a.json: row 1");
     EXPECT_EQ(members.integer("n", 5, 5), 5U);
     EXPECT_EQ(members.number("x"), 1.5);

@@ -15,11 +15,11 @@
 
 namespace {
 
-using base::checkWritable;
-using base::Error;
-using base::expectOwnFile;
-using base::isSamePlace;
-using base::writeFile;
+using morvik::base::checkWritable;
+using morvik::base::Error;
+using morvik::base::expectOwnFile;
+using morvik::base::isSamePlace;
+using morvik::base::writeFile;
 
 std::string messageOf(const std::exception_ptr& thrown)
 {
@@ -49,7 +49,7 @@ std::string refusal(const std::string& file, const std::string& content)
 }
 
 /// Hidden files, too.
-std::vector<std::string> everythingIn(const support::TemporaryFolder& folder)
+std::vector<std::string> everythingIn(const morvik::support::TemporaryFolder& folder)
 {
     std::vector<std::string> names;
     for (const auto& entry : std::filesystem::directory_iterator(folder.path())) {
@@ -60,7 +60,7 @@ std::vector<std::string> everythingIn(const support::TemporaryFolder& folder)
 
 class OutputFile : public testing::Test {
 protected:
-    const support::TemporaryFolder folder;
+    const morvik::support::TemporaryFolder folder;
     const std::string file = folder.path("file.csv");
 };
 
@@ -149,13 +149,13 @@ TEST_F(OutputFile, HasItsNameWhenItIsComplete)
 {
     folder.write("file.csv", "old\n");
     {
-        base::OutputFile output(file);
+        morvik::base::OutputFile output(file);
         output.write("lost\n");
     }
     EXPECT_EQ(folder.read("file.csv"), "old\n");
-    base::OutputFile output(file);
+    morvik::base::OutputFile output(file);
     output.write(std::string(100000, 'x'));
-    base::OutputFile moved(std::move(output));
+    morvik::base::OutputFile moved(std::move(output));
     moved.write("end");
     moved.overwriteStart("start");
     moved.flush();
@@ -178,8 +178,8 @@ TEST_F(OutputFile, LetsNobodyRunItAsAnother)
 TEST_F(OutputFile, IsWrittenToWhereItIsAPipe)
 {
     ASSERT_EQ(mkfifo(file.c_str(), 0600), 0);
-    const base::Descriptor reader(open(file.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
-    base::OutputFile output(file);
+    const morvik::base::Descriptor reader(open(file.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+    morvik::base::OutputFile output(file);
     EXPECT_FALSE(output.isReplaced());
     output.write("one\n");
     output.flush();
@@ -200,7 +200,7 @@ TEST_F(OutputFile, IsWrittenToWhereItIsADevice)
 
 TEST_F(OutputFile, IsWrittenToWhereItIsAnOpenDescriptor)
 {
-    const base::Descriptor opened(open(file.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600));
+    const morvik::base::Descriptor opened(open(file.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600));
     ASSERT_TRUE(opened.write("before\n"));
     std::filesystem::create_symlink("/dev/fd/" + std::to_string(opened.number()), folder.path("link"));
     writeFile(folder.path("link"), "between\n");
@@ -238,7 +238,7 @@ TEST_F(OutputFile, KeepsTheOldContentWhenTheDiskIsFull)
     folder.write("file.csv", "old\n");
     std::string reason;
     {
-        const support::SmallFiles small(1000);
+        const morvik::support::SmallFiles small(1000);
         reason = refusal(file, std::string(1001, 'x'));
         EXPECT_EQ(refusal(file, std::string(1000, 'y')), "none");
     }

@@ -5,8 +5,8 @@
 
 namespace {
 
-using base::visible;
-using base::visibleLines;
+using morvik::base::visible;
+using morvik::base::visibleLines;
 
 TEST(Printable, ShowsControlCharacters)
 {
@@ -43,11 +43,11 @@ TEST(Printable, KeepsLinesWhereThereAreSome)
 
 TEST(Printable, IsCutBetweenCharacters)
 {
-    EXPECT_EQ(base::shortened("abcd", 4), "abcd");
-    EXPECT_EQ(base::shortened("abcde", 4), "abcd...");
-    EXPECT_EQ(base::shortened("a\x1b", 4), "a...");
-    EXPECT_EQ(base::shortened("a\x1b", 5), "a\\x1b");
-    EXPECT_EQ(base::shortened("abc\u00e9", 4), "abc...");
+    EXPECT_EQ(morvik::base::shortened("abcd", 4), "abcd");
+    EXPECT_EQ(morvik::base::shortened("abcde", 4), "abcd...");
+    EXPECT_EQ(morvik::base::shortened("a\x1b", 4), "a...");
+    EXPECT_EQ(morvik::base::shortened("a\x1b", 5), "a\\x1b");
+    EXPECT_EQ(morvik::base::shortened("abc\u00e9", 4), "abc...");
 }
 
 }  // namespace

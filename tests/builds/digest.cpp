@@ -47,13 +47,17 @@ private:
     std::uint64_t itsValue = 0xCBF29CE484222325ULL;
 };
 
-void addBlock(Digest& digest, blocks::Random& random, blocks::Decoder& decoder, blocks::Decoder& lanes, unsigned K)
+void addBlock(Digest& digest,
+              morvik::blocks::Random& random,
+              morvik::blocks::Decoder& decoder,
+              morvik::blocks::Decoder& lanes,
+              unsigned K)
 {
-    const auto values = static_cast<blocks::Values>(blocks::between(random, 0, 3));
-    const auto iterations = static_cast<unsigned>(blocks::between(random, 1, 4));
-    const blocks::Block block = blocks::randomBlock(random, K, values);
+    const auto values = static_cast<morvik::blocks::Values>(morvik::blocks::between(random, 0, 3));
+    const auto iterations = static_cast<unsigned>(morvik::blocks::between(random, 1, 4));
+    const morvik::blocks::Block block = morvik::blocks::randomBlock(random, K, values);
     CapturedStreams streams;
-    const bool traced = K < 200 && blocks::between(random, 0, 7) == 0;
+    const bool traced = K < 200 && morvik::blocks::between(random, 0, 7) == 0;
     veltra_ip_morvik_v1_0_bitacc_dump_config(decoder.state(), traced ? 2 : 0);
     const auto result = decoder.decode(block, iterations);
     const std::string text = streams.out() + streams.err();
@@ -72,17 +76,20 @@ void addBlock(Digest& digest, blocks::Random& random, blocks::Decoder& decoder, 
 int main(int argc, char** argv)
 {
     Digest digest;
-    blocks::Random random(36212);
-    const std::vector<unsigned> sizes = blocks::blockSizes();
+    morvik::blocks::Random random(36212);
+    const std::vector<unsigned> sizes = morvik::blocks::blockSizes();
     for (const int units : {2, 4, 8}) {
         for (const int algorithm : {0, 1, 2}) {
-            blocks::Decoder decoder(units, algorithm);
-            blocks::Decoder lanes(units, algorithm);
+            morvik::blocks::Decoder decoder(units, algorithm);
+            morvik::blocks::Decoder lanes(units, algorithm);
             decoder.decodeByComponents();
             for (unsigned i = 0; i < 36; ++i) {
                 const int last = i % 12 == 0 ? 187 : 70;  // most are small, some of any size
-                addBlock(
-                    digest, random, decoder, lanes, sizes[static_cast<std::size_t>(blocks::between(random, 0, last))]);
+                addBlock(digest,
+                         random,
+                         decoder,
+                         lanes,
+                         sizes[static_cast<std::size_t>(morvik::blocks::between(random, 0, last))]);
             }
         }
     }

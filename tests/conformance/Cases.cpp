@@ -8,7 +8,7 @@
 #include "link/DefaultScale.h"
 #include "link/FrameSource.h"
 
-namespace conformance {
+namespace morvik::conformance {
 
 namespace {
 
@@ -117,4 +117,4 @@ std::vector<Case> readCases(std::istream& text)
     return cases;
 }
 
-}  // namespace conformance
+}  // namespace morvik::conformance

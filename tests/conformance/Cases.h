@@ -9,7 +9,7 @@
 
 #include "support/Blocks.h"
 
-namespace conformance {
+namespace morvik::conformance {
 
 struct Case {
     unsigned K;
@@ -29,6 +29,6 @@ std::string textOf(const std::vector<Case>& cases);
 /// Reads a conformance file, as a test of a binding does. Throws std::runtime_error when it is none.
 std::vector<Case> readCases(std::istream& text);
 
-}  // namespace conformance
+}  // namespace morvik::conformance
 
 #endif

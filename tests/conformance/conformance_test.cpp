@@ -15,13 +15,13 @@
 
 namespace {
 
-using conformance::Case;
+using morvik::conformance::Case;
 
 const std::vector<Case>& cases()
 {
     static const std::vector<Case> all = [] {
         std::ifstream file(MORVIK_CONFORMANCE_BLOCKS);
-        return conformance::readCases(file);
+        return morvik::conformance::readCases(file);
     }();
     return all;
 }
@@ -34,19 +34,19 @@ std::string nameOf(const Case& each)
 
 std::vector<std::uint8_t> decisions(const Case& each, int units, int algorithm, unsigned iterations)
 {
-    return blocks::Decoder(units, algorithm).decode(each.soft, iterations).bits;
+    return morvik::blocks::Decoder(units, algorithm).decode(each.soft, iterations).bits;
 }
 
 template <class Input>
 std::vector<std::uint8_t> batchDecisions(const Case& each, const std::string& set)
 {
-    blocks::Decoder decoder(each.units, each.algorithm);
+    morvik::blocks::Decoder decoder(each.units, each.algorithm);
     EXPECT_EQ(veltra_ip_morvik_v1_0_set_instruction_set(decoder.state(), set.c_str()), 0);
     std::vector<std::uint8_t> bits(each.K);
-    blocks::BatchOutputs outputs{};
+    morvik::blocks::BatchOutputs outputs{};
     outputs.dout = bits.data();
     outputs.dout_alloc = bits.size();
-    const blocks::Batch<Input> batch({each.soft});
+    const morvik::blocks::Batch<Input> batch({each.soft});
     EXPECT_EQ(batch.simulate(decoder.state(), each.iterations, nullptr, &outputs), 0);
     return bits;
 }
@@ -72,7 +72,7 @@ TEST(Conformance, SimulateDecidesAsTheFileSays)
 
 TEST(Conformance, EveryInstructionSetDecidesAsTheFileSays)
 {
-    for (const std::string& set : blocks::instructionSets()) {
+    for (const std::string& set : morvik::blocks::instructionSets()) {
         for (const Case& each : cases()) {
             EXPECT_TRUE(batchDecisions<std::int8_t>(each, set) == each.bits) << set << ", 8 bits, " << nameOf(each);
             EXPECT_TRUE(batchDecisions<std::int16_t>(each, set) == each.bits) << set << ", 16 bits, " << nameOf(each);

@@ -11,7 +11,7 @@
 int main(int argc, char** argv)
 {
     try {
-        const std::string text = conformance::textOf(conformance::makeCases());
+        const std::string text = morvik::conformance::textOf(morvik::conformance::makeCases());
         if (argc < 2) {
             std::fwrite(text.data(), 1, text.size(), stdout);
             return 0;

@@ -6,7 +6,7 @@
 #include <iostream>
 #include <string>
 
-#include "comparison/Model.h"
+#include "hardware/comparison/Model.h"
 
 namespace {
 

@@ -10,9 +10,9 @@ For each fault, OUT/NAME/ receives the unit to compile and, where the fault is i
 import pathlib
 import sys
 
-DECODER = "TDecoder3G.cpp"
-SEGMENTS = "TDecoder3GPU.cpp"
-ENGINE = "TCalculationEngineModBase.cpp"
+DECODER = "src/TDecoder3G.cpp"
+SEGMENTS = "src/TDecoder3GPU.cpp"
+ENGINE = "src/TCalculationEngineModBase.cpp"
 
 # Name: the unit, the file that is changed, and pairs of what stands there and what is put in its place.
 FAULTS = {
@@ -51,24 +51,24 @@ FAULTS = {
     "branch_eight_bits": (ENGINE, ENGINE, [("wrap16(arithmetic::clip(sums[i], lo, hi))",
                                             "wrap16(lo < hi ? static_cast<signed char>(sums[i] / 16) * 16 : 0)")]),
     "parity_sign": (ENGINE, ENGINE, [("2 * intrinsic[k], parity0[k]", "2 * intrinsic[k], -parity0[k]")]),
-    "metrics_unwrapped": (ENGINE, "Arithmetic.h", [
+    "metrics_unwrapped": (ENGINE, "rules/Arithmetic.h", [
         ("return wrap16(std::int32_t{a} + b);",
          "const std::int32_t sum = std::int32_t{a} + b;\n"
          "    return wrap16(sum < -32768 ? -32768 : sum > 32752 ? 32752 : sum);"),
         ("return wrap16(std::int32_t{a} - b);",
          "const std::int32_t sum = std::int32_t{a} - b;\n"
          "    return wrap16(sum < -32768 ? -32768 : sum > 32752 ? 32752 : sum);")]),
-    "ratio_sign": (ENGINE, "Trellis.h", [("subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g))",
+    "ratio_sign": (ENGINE, "rules/Trellis.h", [("subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g))",
                                           "subWrap(bestPath<0>(rule, a, b, g), bestPath<1>(rule, a, b, g))")]),
-    "ratio_rounding": (ENGINE, "Trellis.h", [
+    "ratio_rounding": (ENGINE, "rules/Trellis.h", [
         ("return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));",
          "return static_cast<Value>(subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g)) + "
          "16 * (a[0] & 16 ? 1 : 0));")]),
-    "ratio_unwrapped": (ENGINE, "Trellis.h", [
+    "ratio_unwrapped": (ENGINE, "rules/Trellis.h", [
         ("return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));",
          "const int ratio = bestPath<1>(rule, a, b, g) - bestPath<0>(rule, a, b, g);\n"
          "    return static_cast<Value>(ratio < -32768 ? -32768 : ratio > 32752 ? 32752 : ratio);")]),
-    "tail_sign": (SEGMENTS, "Trellis.h", [("{-e2 - e1 - g0,", "{-e2 - e1 + g0,")]),
+    "tail_sign": (SEGMENTS, "rules/Trellis.h", [("{-e2 - e1 - g0,", "{-e2 - e1 + g0,")]),
     "tail_bits_kept": (SEGMENTS, SEGMENTS, [("    *column = border(*column);\n", "")]),
     "forward_bits_kept": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);", "starts[u] = reached;")]),
     "forward_border_unknown": (SEGMENTS, SEGMENTS, [("starts[u] = border(reached);",
@@ -101,7 +101,7 @@ FAULTS = {
                                                         "itsAlphaInit[1 - constituent(h)][u] = border(reached);")]),
     "backward_border_stale": (SEGMENTS, SEGMENTS, [("stored = border(reached);",
                                                     "stored = h < 2 ? border(reached) : stored;")]),
-    "tail_clipped": (SEGMENTS, "Trellis.h", [
+    "tail_clipped": (SEGMENTS, "rules/Trellis.h", [
         ("t.x[2] + t.p[2] + t.q[2];", "arithmetic::clip(t.x[2] + t.p[2], -2048, 2032);"),
         ("t.x[1] + t.p[1] + t.q[1];", "arithmetic::clip(t.x[1] + t.p[1], -2048, 2032);"),
         ("t.x[1] - t.p[1] + t.q[1];", "arithmetic::clip(t.x[1] - t.p[1], -2048, 2032);"),
@@ -115,7 +115,7 @@ FAULTS = {
     "metrics_kept_in_eleven_bits": (ENGINE, ENGINE, [
         ("column[state] = rule.stored(metrics[state]);",
          "column[state] = static_cast<short>(wrap16(2 * rule.stored(metrics[state])) / 2);")]),
-    "metrics_eleven_bits": (ENGINE, "Arithmetic.h", [
+    "metrics_eleven_bits": (ENGINE, "rules/Arithmetic.h", [
         ("return wrap16(std::int32_t{a} + b);", "return static_cast<Value>(wrap16(2 * (std::int32_t{a} + b)) / 2);"),
         ("return wrap16(std::int32_t{a} - b);", "return static_cast<Value>(wrap16(2 * (std::int32_t{a} - b)) / 2);")]),
     "parity_negated_in_eight": (ENGINE, ENGINE, [

@@ -1,6 +1,6 @@
 // FuzzInput: takes numbers and texts off the bytes that a fuzzer gives.
-#ifndef MORVIK_TESTS_FUZZINPUT_H
-#define MORVIK_TESTS_FUZZINPUT_H
+#ifndef MORVIK_TESTS_FUZZ_FUZZINPUT_H
+#define MORVIK_TESTS_FUZZ_FUZZINPUT_H
 
 #include <cstddef>
 #include <cstdint>

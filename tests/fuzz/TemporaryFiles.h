@@ -1,6 +1,6 @@
 // TemporaryFiles: files for readers that open them by name.
-#ifndef MORVIK_TESTS_TEMPORARYFILES_H
-#define MORVIK_TESTS_TEMPORARYFILES_H
+#ifndef MORVIK_TESTS_FUZZ_TEMPORARYFILES_H
+#define MORVIK_TESTS_FUZZ_TEMPORARYFILES_H
 
 #include <unistd.h>
 

@@ -7,10 +7,10 @@
 
 namespace {
 
-void requireSense(const report::Curve& curve)
+void requireSense(const morvik::report::Curve& curve)
 {
     double last = -1000;
-    for (const report::Sample& sample : curve.samples) {
+    for (const morvik::report::Sample& sample : curve.samples) {
         require(sample.ebn0 >= last && sample.ebn0 <= 1000, "points are in the order of Eb/N0");
         last = sample.ebn0;
         for (const double rate : {sample.ber,
@@ -34,12 +34,12 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
     TemporaryFiles files;
     files.write(name, input.text());
     try {
-        const auto curves = report::readReference(files.folder() + '/' + name);
+        const auto curves = morvik::report::readReference(files.folder() + '/' + name);
         require(!curves.empty(), "a file that is taken has a curve");
-        for (const report::Curve& curve : curves) {
+        for (const morvik::report::Curve& curve : curves) {
             requireSense(curve);
         }
-        report::againstIterations(curves);
+        morvik::report::againstIterations(curves);
     } catch (const std::runtime_error& error) {
         requireOneLine(error, files.folder() + '/' + name);
     }

@@ -25,7 +25,7 @@ unsigned blockErrors(int type, int milliDecibels, double scale)
     FrameSource source(K, milliDecibels, scale, 1);
     Frames frames;
     source.make(0, frameCount, frames);
-    const blocks::Decoder decoder(4, type);
+    const morvik::blocks::Decoder decoder(4, type);
     std::vector<std::uint8_t> bits(frames.sent.size());
     veltra_ip_morvik_v1_0_batch_outputs outputs{};
     outputs.dout = bits.data();

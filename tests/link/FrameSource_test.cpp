@@ -49,7 +49,7 @@ void expectSame(const Frames& a, const Frames& b)
 
 std::vector<std::uint8_t> decoded(const Frames& frames, unsigned K)
 {
-    const blocks::Decoder decoder(4, 1);
+    const morvik::blocks::Decoder decoder(4, 1);
     std::vector<std::uint8_t> bits(frames.sent.size());
     veltra_ip_morvik_v1_0_batch_outputs outputs{};
     outputs.dout = bits.data();

@@ -42,11 +42,11 @@ TurboEncoder::Streams encode(TurboEncoder& encoder, const std::vector<std::vecto
     return streams;
 }
 
-std::vector<std::vector<int>> randomBlocks(blocks::Random& random, unsigned K, unsigned count)
+std::vector<std::vector<int>> randomBlocks(morvik::blocks::Random& random, unsigned K, unsigned count)
 {
     std::vector<std::vector<int>> made;
     for (unsigned b = 0; b < count; ++b) {
-        made.push_back(blocks::randomBits(random, K));
+        made.push_back(morvik::blocks::randomBits(random, K));
     }
     return made;
 }
@@ -85,17 +85,17 @@ TEST(TurboEncoderTest, RefusesWhatIsNoBlockSize)
 
 TEST(TurboEncoderTest, EncodesAsAPlainEncoderDoesForAllSizes)
 {
-    blocks::Random random(1);
-    for (const unsigned K : blocks::blockSizes()) {
+    morvik::blocks::Random random(1);
+    for (const unsigned K : morvik::blocks::blockSizes()) {
         TurboEncoder encoder(K);
         EXPECT_EQ(encoder.words(), (K + 4 + 63) / 64) << K;
         for (const unsigned count : {1U, K % 61 + 2, 64U}) {
             const auto information = randomBlocks(random, K, count);
             const TurboEncoder::Streams streams = encode(encoder, information);
             for (unsigned b = 0; b < count; b += b + 3 < count ? 3 : 1) {
-                const blocks::Block plain = blocks::encode(information[b], 1);
+                const morvik::blocks::Block plain = morvik::blocks::encode(information[b], 1);
                 for (unsigned k = 0; k < 64 * encoder.words(); ++k) {
-                    const auto expected = [k, K](const blocks::Stream& stream) {
+                    const auto expected = [k, K](const morvik::blocks::Stream& stream) {
                         return k < K + 4 && stream[k] > 0;
                     };
                     ASSERT_EQ(bitAt(streams[0], b, k), expected(plain.sys)) << K << ' ' << b << ' ' << k;
@@ -109,12 +109,12 @@ TEST(TurboEncoderTest, EncodesAsAPlainEncoderDoesForAllSizes)
 
 TEST(TurboEncoderTest, EndsBothTrellisesInStateZero)
 {
-    blocks::Random random(2);
-    for (const unsigned K : blocks::blockSizes()) {
+    morvik::blocks::Random random(2);
+    for (const unsigned K : morvik::blocks::blockSizes()) {
         TurboEncoder encoder(K);
         const auto information = randomBlocks(random, K, 2);
         const TurboEncoder::Streams streams = encode(encoder, information);
-        const std::vector<unsigned> permutation = plain::permutation(K);
+        const std::vector<unsigned> permutation = morvik::plain::permutation(K);
         for (unsigned b = 0; b < 2; ++b) {
             const std::array<bool, 12> tail = tailOf(streams, b, K);
             for (unsigned constituent = 0; constituent < 2; ++constituent) {
@@ -135,7 +135,7 @@ TEST(TurboEncoderTest, EndsBothTrellisesInStateZero)
 
 TEST(TurboEncoderTest, TheCodeIsLinear)
 {
-    blocks::Random random(3);
+    morvik::blocks::Random random(3);
     for (const unsigned K : {40U, 48U, 56U, 64U, 120U, 512U, 1504U, 6144U}) {
         TurboEncoder encoder(K);
         // Block 0 is zero, and every third one from 3 on is the sum of the two before.
@@ -160,7 +160,7 @@ TEST(TurboEncoderTest, TheCodeIsLinear)
 
 TEST(TurboEncoderTest, ForgetsTheBlocksOfTheCallBefore)
 {
-    blocks::Random random(4);
+    morvik::blocks::Random random(4);
     TurboEncoder encoder(104);
     const auto information = randomBlocks(random, 104, 5);
     const TurboEncoder::Streams first = encode(encoder, information);
@@ -178,8 +178,8 @@ TEST(TurboEncoderTest, AgreesWithTheBlocksOfAnotherEncoder)
 {
     std::array<int, 12> tail{};  // by their place, how far the tail's values lie on the right side
     std::array<int, 12> magnitude{};
-    for (const std::string& name : blocks::sentBlockNames()) {
-        for (const blocks::SentBlock& sent : blocks::readSentBlocks(name)) {
+    for (const std::string& name : morvik::blocks::sentBlockNames()) {
+        for (const morvik::blocks::SentBlock& sent : morvik::blocks::readSentBlocks(name)) {
             std::vector<int> bits;
             for (const char bit : sent.bits) {
                 bits.push_back(bit - '0');
@@ -188,7 +188,7 @@ TEST(TurboEncoderTest, AgreesWithTheBlocksOfAnotherEncoder)
             TurboEncoder encoder(K);
             const TurboEncoder::Streams streams = encode(encoder, {bits});
             unsigned s = 0;
-            for (const blocks::Stream* soft : {&sent.soft.sys, &sent.soft.par1, &sent.soft.par2}) {
+            for (const morvik::blocks::Stream* soft : {&sent.soft.sys, &sent.soft.par1, &sent.soft.par2}) {
                 unsigned wrong = 0;
                 for (unsigned k = 0; k < K + 4; ++k) {
                     const int signedValue = bitAt(streams[s], 0, k) ? (*soft)[k] : -(*soft)[k];
@@ -210,14 +210,14 @@ TEST(TurboEncoderTest, AgreesWithTheBlocksOfAnotherEncoder)
 
 TEST(TurboEncoderTest, IsUnderstoodByTheDecoder)
 {
-    blocks::Random random(5);
-    blocks::Decoder decoder(4, 1);
+    morvik::blocks::Random random(5);
+    morvik::blocks::Decoder decoder(4, 1);
     for (const unsigned K : {40U, 512U, 1504U, 6144U}) {
         TurboEncoder encoder(K);
         const auto information = randomBlocks(random, K, 3);
         const TurboEncoder::Streams streams = encode(encoder, information);
         for (unsigned b = 0; b < 3; ++b) {
-            blocks::Block block;
+            morvik::blocks::Block block;
             for (unsigned k = 0; k < K + 4; ++k) {
                 block.sys.push_back(bitAt(streams[0], b, k) ? 16 : -16);
                 block.par1.push_back(bitAt(streams[1], b, k) ? 16 : -16);

@@ -5,7 +5,7 @@
 
 namespace {
 
-using namespace report;
+using namespace morvik::report;
 
 Row row(const Setting& setting, double ebn0)
 {

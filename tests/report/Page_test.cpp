@@ -12,7 +12,7 @@
 
 namespace {
 
-using namespace report;
+using namespace morvik::report;
 
 class Page : public testing::Test {
 protected:
@@ -27,7 +27,7 @@ protected:
         return itsFiles.read("r.html");
     }
 
-    const support::TemporaryFolder itsFiles;
+    const morvik::support::TemporaryFolder itsFiles;
 };
 
 std::size_t count(const std::string& text, const std::string& part)
@@ -42,7 +42,7 @@ std::size_t count(const std::string& text, const std::string& part)
 TEST_F(Page, HoldsTitleParametersAndCommand)
 {
     const std::string text =
-        page(support::sampleCurves(), {"A run", {{"Seed", "7"}, {"Note", "a < b"}}, "morvik ber --seed 7"});
+        page(morvik::support::sampleCurves(), {"A run", {{"Seed", "7"}, {"Note", "a < b"}}, "morvik ber --seed 7"});
     EXPECT_EQ(text.rfind("<!DOCTYPE html>\n<html lang=\"en\">", 0), 0U);
     EXPECT_EQ(count(text, "<title>A run</title>"), 1U);
     EXPECT_EQ(count(text, "<h1>A run</h1>"), 1U);
@@ -54,7 +54,7 @@ TEST_F(Page, HoldsTitleParametersAndCommand)
 
 TEST_F(Page, HasARowForEachPoint)
 {
-    const std::string text = page(support::sampleCurves());
+    const std::string text = page(morvik::support::sampleCurves());
     EXPECT_EQ(count(text, "<tr id=\"p"), 29U);
     EXPECT_EQ(count(text, "<tbody"), 3U);
     EXPECT_EQ(count(text, "<tbody class=\"reference\">"), 1U);
@@ -86,7 +86,7 @@ TEST_F(Page, LeavesOutWhatIsNotKnown)
 
 TEST_F(Page, TextsAreNeverMarkup)
 {
-    const auto curves = support::hostileCurves();
+    const auto curves = morvik::support::hostileCurves();
     const std::string text = page(curves, {curves[1].title, {{curves[0].title, curves[1].title}}, curves[0].title});
     EXPECT_EQ(count(text, "<script"), 2U) << "the data and the program";
     EXPECT_EQ(count(text, "</script"), 2U);
@@ -99,7 +99,7 @@ TEST_F(Page, TextsAreNeverMarkup)
 
 TEST_F(Page, NamesNoOtherPlace)
 {
-    const std::string text = page(support::sampleCurves());
+    const std::string text = page(morvik::support::sampleCurves());
     const std::regex place("(https?:)?//[A-Za-z0-9][^\"' ]*|url\\(|@import| src=| href=");
     std::vector<std::string> places;
     for (std::sregex_iterator found(text.begin(), text.end(), place), end; found != end; ++found) {
@@ -111,9 +111,9 @@ TEST_F(Page, NamesNoOtherPlace)
 
 TEST_F(Page, TheSameCurvesGiveTheSamePage)
 {
-    const std::string text = page(support::sampleCurves());
+    const std::string text = page(morvik::support::sampleCurves());
     const CommaLocale locale;
-    EXPECT_TRUE(page(support::sampleCurves()) == text);
+    EXPECT_TRUE(page(morvik::support::sampleCurves()) == text);
 }
 
 TEST_F(Page, IsWrittenWhollyOrNotAtAll)

@@ -15,7 +15,7 @@
 
 namespace {
 
-using namespace report;
+using namespace morvik::report;
 
 /// What is looked up in PATH, for the lifetime of the object.
 class ProgramsIn {
@@ -44,7 +44,7 @@ protected:
         return itsFiles.path(name);
     }
 
-    std::string drawn(const std::string& name, const std::vector<Curve>& curves = support::sampleCurves()) const
+    std::string drawn(const std::string& name, const std::vector<Curve>& curves = morvik::support::sampleCurves()) const
     {
         writePlot(path(name), curves, "Title");
         return itsFiles.read(name);
@@ -59,7 +59,7 @@ protected:
         return path("bin");
     }
 
-    const support::TemporaryFolder itsFiles;
+    const morvik::support::TemporaryFolder itsFiles;
 };
 
 template <class Function>
@@ -77,7 +77,7 @@ std::string refusal(Function function)
 std::string sayings(const std::string& path)
 {
     std::string check = refusal([&path] { checkPlot(path); });
-    EXPECT_EQ(check, refusal([&path] { writePlot(path, support::sampleCurves(), "Title"); }));
+    EXPECT_EQ(check, refusal([&path] { writePlot(path, morvik::support::sampleCurves(), "Title"); }));
     return check;
 }
 
@@ -200,7 +200,7 @@ TEST_F(Plot, DrawsWhatThereIs)
 
 TEST_F(Plot, ZeroHasNoPlaceOnALogarithmicAxis)
 {
-    std::vector<Curve> curves = support::sampleCurves();
+    std::vector<Curve> curves = morvik::support::sampleCurves();
     const std::string picture = drawn("a.svg", curves);
     Sample zero;
     zero.ebn0 = 0.5;
@@ -213,7 +213,7 @@ TEST_F(Plot, ManySeriesAndLongTitlesStayWithinThePicture)
 {
     std::vector<Curve> curves;
     for (int i = 0; i < 40; ++i) {
-        curves.push_back(support::sampleCurves()[1]);
+        curves.push_back(morvik::support::sampleCurves()[1]);
         curves.back().title = std::to_string(i) + std::string(300, 'x');
     }
     const std::string picture = drawn("a.svg", curves);
@@ -223,14 +223,14 @@ TEST_F(Plot, ManySeriesAndLongTitlesStayWithinThePicture)
 
 TEST_F(Plot, ShowsIterationsInPanelsOfTheirOwn)
 {
-    const std::string both = drawn("a.svg", support::iterationCurves(4, {0, 0.25, 1.5}));
+    const std::string both = drawn("a.svg", morvik::support::iterationCurves(4, {0, 0.25, 1.5}));
     EXPECT_NE(both.find(">Iterations<"), std::string::npos);
     EXPECT_NE(both.find(">K = 512, 8 units, scaled, 4 iterations<"), std::string::npos);
     EXPECT_NE(both.find(">K = 512, 8 units, scaled, 0.25 dB<"), std::string::npos);
     EXPECT_NE(both.find("height=\"" + std::to_string(2 * (72 + 430 + 66) + (2 + 1) * 22 + 34) + "\""),
               std::string::npos)
         << both.substr(0, 300);
-    const std::string one = drawn("b.svg", support::iterationCurves(4, {0.25}));
+    const std::string one = drawn("b.svg", morvik::support::iterationCurves(4, {0.25}));
     EXPECT_NE(one.find(">Iterations<"), std::string::npos);
     EXPECT_EQ(one.find("4 iterations<"), std::string::npos) << "points are no curve";
     EXPECT_NE(one.find("height=\"" + std::to_string(72 + 430 + 66 + 22 + 34) + "\""), std::string::npos);

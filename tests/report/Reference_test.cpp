@@ -11,7 +11,7 @@
 
 namespace {
 
-using namespace report;
+using namespace morvik::report;
 
 class Reference : public testing::Test {
 protected:
@@ -37,7 +37,7 @@ protected:
         return itsFiles.path(name);
     }
 
-    const support::TemporaryFolder itsFiles;
+    const morvik::support::TemporaryFolder itsFiles;
 };
 
 Curve readOnly(const std::string& name)

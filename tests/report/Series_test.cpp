@@ -11,11 +11,11 @@
 
 namespace {
 
-using namespace report;
+using namespace morvik::report;
 
-const Curve curve = support::sampleCurves().at(1);
-const Curve farCurve = support::sampleCurves().at(2);
-const Curve reference = support::sampleCurves().at(0);
+const Curve curve = morvik::support::sampleCurves().at(1);
+const Curve farCurve = morvik::support::sampleCurves().at(2);
+const Curve reference = morvik::support::sampleCurves().at(0);
 
 /// The curve with its rates multiplied.
 Curve multiplied(Curve result, double factor)
@@ -75,7 +75,7 @@ TEST(Series, SeriesOfAColourDifferInMarkerAndDash)
 
 TEST(Series, AFamilyIsToldApartWithoutColours)
 {
-    const std::vector<Curve> curves = support::iterationCurves(15, {0, 1});
+    const std::vector<Curve> curves = morvik::support::iterationCurves(15, {0, 1});
     std::set<std::pair<std::size_t, std::size_t>> looks;
     for (std::size_t i = 0; i < curves.size(); ++i) {
         looks.emplace(lookOf(curves, i).marker, lookOf(curves, i).dash);
@@ -136,7 +136,7 @@ int brightness(const std::string& colour)
 
 TEST(Series, ALargeFamilyHasColoursThatRun)
 {
-    std::vector<Curve> curves = support::iterationCurves(15, {0, 1});
+    std::vector<Curve> curves = morvik::support::iterationCurves(15, {0, 1});
     curves.push_back(reference);
     std::set<std::string> seen;
     for (std::size_t i = 0; i < 15; ++i) {
@@ -155,7 +155,7 @@ TEST(Series, ALargeFamilyHasColoursThatRun)
 
 TEST(Series, FamiliesHaveOtherColoursEach)
 {
-    std::vector<Curve> curves = support::iterationCurves(4, {0});
+    std::vector<Curve> curves = morvik::support::iterationCurves(4, {0});
     const std::vector<Curve> first = curves;
     for (Curve each : first) {
         each.family = "another";
@@ -171,7 +171,7 @@ TEST(Series, FamiliesHaveOtherColoursEach)
 
 TEST(Series, ASmallFamilyHasColoursThatDiffer)
 {
-    const std::vector<Curve> curves = support::iterationCurves(3, {0});
+    const std::vector<Curve> curves = morvik::support::iterationCurves(3, {0});
     for (std::size_t i = 0; i < curves.size(); ++i) {
         EXPECT_EQ(lookOf(curves, i).colour.onLight, colours[i].onLight);
     }
@@ -179,8 +179,8 @@ TEST(Series, ASmallFamilyHasColoursThatDiffer)
 
 TEST(Series, AreSeenAgainstIterationsWhereThereAreSome)
 {
-    EXPECT_EQ(viewsOf(support::sampleCurves()).size(), 1U);
-    std::vector<Curve> curves = support::iterationCurves(3, {0, 1});
+    EXPECT_EQ(viewsOf(morvik::support::sampleCurves()).size(), 1U);
+    std::vector<Curve> curves = morvik::support::iterationCurves(3, {0, 1});
     curves.insert(curves.begin(), reference);
     const std::vector<View> views = viewsOf(curves);
     ASSERT_EQ(views.size(), 2U);
@@ -194,12 +194,12 @@ TEST(Series, AreSeenAgainstIterationsWhereThereAreSome)
         each.reference = true;
     }
     EXPECT_EQ(viewsOf(curves).size(), 1U) << "references alone";
-    EXPECT_EQ(viewsOf(support::iterationCurves(2, std::vector<double>(40, 1))).size(), 2U);
+    EXPECT_EQ(viewsOf(morvik::support::iterationCurves(2, std::vector<double>(40, 1))).size(), 2U);
     std::vector<double> many;
     for (int i = 0; i <= 40; ++i) {
         many.push_back(i);
     }
-    EXPECT_EQ(viewsOf(support::iterationCurves(2, many)).size(), 1U) << "more than can be told apart";
+    EXPECT_EQ(viewsOf(morvik::support::iterationCurves(2, many)).size(), 1U) << "more than can be told apart";
 }
 
 }  // namespace

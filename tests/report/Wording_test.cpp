@@ -7,7 +7,7 @@
 
 namespace {
 
-using namespace report;
+using namespace morvik::report;
 
 TEST(Wording, PrintableKeepsWholeCharacters)
 {

@@ -12,12 +12,12 @@ namespace {
 
 void write(const std::string& folder)
 {
-    const std::vector<report::Curve> curves = support::sampleCurves();
+    const std::vector<morvik::report::Curve> curves = morvik::support::sampleCurves();
     const std::string title = "Error rates of a made-up decoder";
     for (const char* const name : {"/plot.svg", "/plot.png", "/plot.pdf"}) {
-        report::writePlot(folder + name, curves, title);
+        morvik::report::writePlot(folder + name, curves, title);
     }
-    report::writeReport(
+    morvik::report::writeReport(
         folder + "/report.html",
         curves,
         {title,
@@ -27,17 +27,18 @@ void write(const std::string& folder)
 
 void writeIterations(const std::string& folder)
 {
-    const std::vector<report::Curve> curves = support::iterationCurves(12, {0, 0.25, 0.5, 0.75, 1});
-    report::writePlot(folder + "/iterations.png", curves, "After each iteration");
-    report::writeReport(folder + "/iterations.html", curves, {"After each iteration", {}, ""});
-    report::writeReport(folder + "/one_ebn0.html", support::iterationCurves(12, {1}), {"At one Eb/N0", {}, ""});
+    const std::vector<morvik::report::Curve> curves = morvik::support::iterationCurves(12, {0, 0.25, 0.5, 0.75, 1});
+    morvik::report::writePlot(folder + "/iterations.png", curves, "After each iteration");
+    morvik::report::writeReport(folder + "/iterations.html", curves, {"After each iteration", {}, ""});
+    morvik::report::writeReport(
+        folder + "/one_ebn0.html", morvik::support::iterationCurves(12, {1}), {"At one Eb/N0", {}, ""});
 }
 
 void writeHostile(const std::string& folder)
 {
-    const std::vector<report::Curve> curves = support::hostileCurves();
-    report::writePlot(folder + "/hostile.svg", curves, curves[1].title);
-    report::writeReport(
+    const std::vector<morvik::report::Curve> curves = morvik::support::hostileCurves();
+    morvik::report::writePlot(folder + "/hostile.svg", curves, curves[1].title);
+    morvik::report::writeReport(
         folder + "/hostile.html", curves, {curves[1].title, {{curves[1].title, curves[0].title}}, curves[0].title});
 }
 

@@ -14,11 +14,13 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 PointResult resultOf(std::size_t number, std::size_t counts)
 {
-    return {number, support::countOneByOne(support::SyntheticFrames(3), {0, 500}, StopRules(), counts), 1.5};
+    return {number,
+            morvik::support::countOneByOne(morvik::support::SyntheticFrames(3), {0, 500}, StopRules(), counts),
+            1.5};
 }
 
 const Checkpoint example = {"1.2.3", "morvik ber", {resultOf(0, 1), resultOf(2, 3)}, resultOf(3, 2), {resultOf(4, 1)}};
@@ -32,7 +34,7 @@ void expectSame(const PointResult& got, const PointResult& expected)
 {
     EXPECT_EQ(got.number, expected.number);
     EXPECT_EQ(got.seconds, expected.seconds);
-    support::expectEqual(got.tally, expected.tally);
+    morvik::support::expectEqual(got.tally, expected.tally);
 }
 
 TEST(Checkpoint, IsReadAsItWasWritten)

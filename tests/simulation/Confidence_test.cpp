@@ -8,7 +8,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 /// The probability of at most `events` of `trials` that happen with the given rate each.
 double atMost(int events, int trials, double rate)

@@ -7,7 +7,7 @@
 
 namespace {
 
-using simulation::whyNoText;
+using morvik::simulation::whyNoText;
 using namespace std::string_literals;
 
 TEST(FileKind, KnowsWhatIsNoText)

@@ -14,7 +14,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 /// Wrong bits of each frame after each count of iterations, decoded one at a time.
 BatchResult oneByOne(const Plan& plan, const FrameBatch& batch)
@@ -29,8 +29,8 @@ BatchResult oneByOne(const Plan& plan, const FrameBatch& batch)
         source.make(frame, 1, frames);
         const std::size_t counts = plan.countsOf(point);
         for (std::size_t i = 0; i < counts; ++i) {
-            blocks::Decoder decoder(static_cast<int>(point.numPu), static_cast<int>(point.algorithm));
-            blocks::Block block;
+            morvik::blocks::Decoder decoder(static_cast<int>(point.numPu), static_cast<int>(point.algorithm));
+            morvik::blocks::Block block;
             block.sys.assign(frames.streams[0].begin(), frames.streams[0].end());
             block.par1.assign(frames.streams[1].begin(), frames.streams[1].end());
             block.par2.assign(frames.streams[2].begin(), frames.streams[2].end());

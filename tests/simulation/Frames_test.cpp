@@ -5,7 +5,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 FrameSet framesOf(const char* text)
 {

@@ -10,7 +10,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 using Earlier = Journal::Earlier;
 using Names = std::vector<std::string>;
 
@@ -25,13 +25,16 @@ protected:
 
     static PointResult resultOf(std::size_t number, std::uint64_t blocks)
     {
-        return {number, support::countOneByOne(support::SyntheticFrames(1), {0, blocks}, StopRules(), 1), 1};
+        return {number,
+                morvik::support::countOneByOne(morvik::support::SyntheticFrames(1), {0, blocks}, StopRules(), 1),
+                1};
     }
 
     /// The same number of frames, behind those.
     static PointResult later(std::size_t number)
     {
-        return {number, support::countOneByOne(support::SyntheticFrames(1), {20, 40}, StopRules(), 1), 1};
+        return {
+            number, morvik::support::countOneByOne(morvik::support::SyntheticFrames(1), {20, 40}, StopRules(), 1), 1};
     }
 
     /// Why the journal cannot be opened.
@@ -45,7 +48,7 @@ protected:
         return "none";
     }
 
-    const support::TemporaryFolder folder;
+    const morvik::support::TemporaryFolder folder;
     const std::string output = folder.path("results.csv");
     const std::string checkpoint = output + ".checkpoint";
     Plan plan;
@@ -102,8 +105,8 @@ TEST_F(JournalFiles, TellHowFarARunHasCome)
     const Journal journal(plan, output, Earlier::resume);
     EXPECT_FALSE(journal.isEmpty());
     ASSERT_EQ(journal.ended().size(), 1U);
-    support::expectEqual(journal.ended()[0].tally, resultOf(0, 20).tally);
-    support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 7).tally);
+    morvik::support::expectEqual(journal.ended()[0].tally, resultOf(0, 20).tally);
+    morvik::support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 7).tally);
     EXPECT_EQ(journal.resultSoFar(1).seconds, 1);
 }
 
@@ -174,7 +177,7 @@ TEST_F(JournalFiles, OfACompleteRunWithSmallerLimitsAreGoneOnWith)
         {
             Journal journal(larger, file, Earlier::resume);
             EXPECT_TRUE(journal.ended().empty());
-            support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 20).tally);
+            morvik::support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 20).tally);
             journal.begin();
             EXPECT_EQ(folder.read(name), results) << "until a point has ended";
             journal.end(resultOf(0, 30));
@@ -182,8 +185,8 @@ TEST_F(JournalFiles, OfACompleteRunWithSmallerLimitsAreGoneOnWith)
         }
         Journal journal(larger, file, Earlier::resume);
         ASSERT_EQ(journal.ended().size(), 1U);
-        support::expectEqual(journal.ended()[0].tally, resultOf(0, 30).tally);
-        support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 20).tally);
+        morvik::support::expectEqual(journal.ended()[0].tally, resultOf(0, 30).tally);
+        morvik::support::expectEqual(journal.resultSoFar(1).tally, resultOf(1, 20).tally);
         journal.end(resultOf(1, 30));
         journal.complete();
         const auto points = {resultOf(0, 30), resultOf(1, 30)};

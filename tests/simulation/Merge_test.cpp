@@ -11,8 +11,8 @@
 
 namespace {
 
-using namespace simulation;
-using support::exampleRow;
+using namespace morvik::simulation;
+using morvik::support::exampleRow;
 
 Part partOf(const std::string& name, std::vector<ResultRow> rows)
 {

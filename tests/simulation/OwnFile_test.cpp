@@ -13,11 +13,11 @@
 
 namespace {
 
-using simulation::OwnFile;
+using morvik::simulation::OwnFile;
 
 class OwnFiles : public testing::Test {
 protected:
-    const support::TemporaryFolder folder;
+    const morvik::support::TemporaryFolder folder;
     const std::string name = folder.path("file");
 };
 
@@ -88,20 +88,20 @@ TEST_F(OwnFiles, ThatCannotBeOpenedTellWhenTheyAreWritten)
 {
     OwnFile file(folder.path("none/file"));
     EXPECT_FALSE(file.isTaken());
-    EXPECT_THROW(file.write("x"), simulation::Error);
+    EXPECT_THROW(file.write("x"), morvik::simulation::Error);
 }
 
 TEST_F(OwnFiles, AreNoLinksToOthers)
 {
     folder.write("another", "kept");
     std::filesystem::create_symlink("another", name);
-    EXPECT_THROW(OwnFile{name}, simulation::Error);
+    EXPECT_THROW(OwnFile{name}, morvik::simulation::Error);
     unlink(name.c_str());
     {
         OwnFile file(name);
         unlink(name.c_str());
         std::filesystem::create_symlink("another", name);
-        EXPECT_THROW(file.write("x"), simulation::Error);
+        EXPECT_THROW(file.write("x"), morvik::simulation::Error);
     }
     EXPECT_EQ(folder.read("another"), "kept");
     EXPECT_EQ(folder.names(), (std::vector<std::string>{"another", "file"}));

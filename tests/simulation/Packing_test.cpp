@@ -10,7 +10,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 void expectEqual(const FrameBatch& got, const FrameBatch& expected)
 {
@@ -41,7 +41,7 @@ TEST(Packing, KeepsResults)
 {
     for (const std::size_t counts : {1U, 2U, 15U}) {
         for (const std::uint32_t count : {1U, 2U, 64U, 1000U}) {
-            expectKept(support::SyntheticFrames(7).result({3, std::uint64_t{1} << 40, count}, counts));
+            expectKept(morvik::support::SyntheticFrames(7).result({3, std::uint64_t{1} << 40, count}, counts));
         }
     }
 }

@@ -5,11 +5,11 @@
 
 #include <algorithm>
 
-#include "standard/BlockSizes.h"
+#include "rules/BlockSizes.h"
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 Sweep sweepOf(std::vector<int> milliDecibels)
 {

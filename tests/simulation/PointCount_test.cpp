@@ -11,10 +11,10 @@
 
 namespace {
 
-using namespace simulation;
-using support::countOneByOne;
-using support::expectEqual;
-using support::SyntheticFrames;
+using namespace morvik::simulation;
+using morvik::support::countOneByOne;
+using morvik::support::expectEqual;
+using morvik::support::SyntheticFrames;
 
 TEST(PointCount, OfAnEmptyRangeIsComplete)
 {

@@ -13,8 +13,8 @@
 
 namespace {
 
-using namespace simulation;
-using support::exampleRow;
+using namespace morvik::simulation;
+using morvik::support::exampleRow;
 
 const std::string header =
     "point,block_size,num_pu,algorithm,scale_option,iterations,ebn0_db,scale,frames,blocks,bit_errors,block_errors,"
@@ -56,7 +56,7 @@ protected:
         return text.replace(place, field.size(), replacement);
     }
 
-    const support::TemporaryFolder folder;
+    const morvik::support::TemporaryFolder folder;
 };
 
 TEST_F(ResultFiles, HoldARowForEachPointAsCsv)

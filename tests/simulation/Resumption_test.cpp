@@ -10,7 +10,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 class Resumption : public testing::Test {
 protected:
@@ -25,7 +25,9 @@ protected:
     PointResult resultOf(std::size_t number, std::uint64_t blocks) const
     {
         const std::size_t counts = plan.countsOf(plan.points[0]);
-        return {number, support::countOneByOne(support::SyntheticFrames(1), {0, blocks}, StopRules(), counts), 1};
+        return {number,
+                morvik::support::countOneByOne(morvik::support::SyntheticFrames(1), {0, blocks}, StopRules(), counts),
+                1};
     }
 
     Checkpoint example() const

@@ -15,9 +15,9 @@
 
 namespace {
 
-using namespace simulation;
-using support::countOneByOne;
-using support::SyntheticFrames;
+using namespace morvik::simulation;
+using morvik::support::countOneByOne;
+using morvik::support::SyntheticFrames;
 
 /// The frames of a point of a plan: each has other ones.
 SyntheticFrames framesOf(std::size_t point)
@@ -218,8 +218,8 @@ TEST(Run, EndsAPointWhenItsTimeIsUpButNotWithoutAFrame)
     for (const PointResult& point : journal.ended()) {
         EXPECT_GT(point.tally.blocks, 0U);
         EXPECT_GT(point.seconds, 0);
-        support::expectEqual(point.tally,
-                             countOneByOne(framesOf(point.number), {0, point.tally.blocks}, StopRules(), 1));
+        morvik::support::expectEqual(point.tally,
+                                     countOneByOne(framesOf(point.number), {0, point.tally.blocks}, StopRules(), 1));
     }
 }
 
@@ -227,7 +227,7 @@ TEST(Run, InterruptedAnywhereEndsInTheSameResults)
 {
     Plan plan = planOf({8}, {0, 1, 2});
     plan.rules.blockErrors = 100;
-    const support::TemporaryFolder folder;
+    const morvik::support::TemporaryFolder folder;
     const std::string output = folder.path("results.csv");
     std::mt19937 random(1);
     int interruptions = 0;
@@ -259,7 +259,7 @@ TEST(Run, ExtendedAnywhereEndsInTheSameResults)
         Plan plan = planOf({2}, {0, 1, 2, 3, 4});
         plan.eachIteration = seed % 2 == 0;
         plan.rules.stopBler = 0.13;  // where about half of the points are
-        const support::TemporaryFolder folder;
+        const morvik::support::TemporaryFolder folder;
         std::mt19937 random(seed);
         auto earlier = Journal::Earlier::refuse;
         for (const unsigned limit : {20U, 50U, 120U, 300U}) {
@@ -300,7 +300,7 @@ public:
 TEST(Run, LeavesACheckpointWhenAWorkerFails)
 {
     const Plan plan = planOf({8}, {0});
-    const support::TemporaryFolder folder;
+    const morvik::support::TemporaryFolder folder;
     const std::string output = folder.path("results.csv");
     {
         FailingWorkers workers(plan, 2, 1);

@@ -5,7 +5,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 ErrorCounts countsOf(std::uint64_t bitErrors, std::uint64_t blockErrors)
 {

@@ -7,7 +7,7 @@
 
 namespace {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 TEST(Tally, CountsBitsBlocksAndSquares)
 {

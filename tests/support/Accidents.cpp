@@ -6,7 +6,7 @@
 #include <cmath>
 #include <sstream>
 
-namespace support {
+namespace morvik::support {
 
 namespace {
 
@@ -275,4 +275,4 @@ std::string bitText(const std::vector<SentFrame>& frames)
     return text;
 }
 
-}  // namespace support
+}  // namespace morvik::support

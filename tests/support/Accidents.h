@@ -1,6 +1,6 @@
 // Accidents: what people do to a file of soft values by mistake, done on purpose.
-#ifndef MORVIK_TESTS_ACCIDENTS_H
-#define MORVIK_TESTS_ACCIDENTS_H
+#ifndef MORVIK_TESTS_SUPPORT_ACCIDENTS_H
+#define MORVIK_TESTS_SUPPORT_ACCIDENTS_H
 
 #include <functional>
 #include <string>
@@ -8,7 +8,7 @@
 
 #include "Blocks.h"
 
-namespace support {
+namespace morvik::support {
 
 /// A block on its way to a file, and its line of the reference.
 struct SentFrame {
@@ -35,6 +35,6 @@ void multiply(SentFrame& frame, double factor);
 std::string softText(const std::vector<SentFrame>& frames);
 std::string bitText(const std::vector<SentFrame>& frames);
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -6,7 +6,7 @@
 #include "CapturedStreams.h"
 #include "DecoderState.h"
 
-namespace blocks {
+namespace morvik::blocks {
 
 std::vector<std::string> instructionSets()
 {
@@ -149,4 +149,4 @@ template Decoded decodedOneByOne(State*, const Batch<std::int32_t>&, unsigned, c
 template Decoded decodedOneByOne(State*, const Batch<std::int16_t>&, unsigned, const std::uint32_t*);
 template Decoded decodedOneByOne(State*, const Batch<std::int8_t>&, unsigned, const std::uint32_t*);
 
-}  // namespace blocks
+}  // namespace morvik::blocks

@@ -1,6 +1,6 @@
 // Batches: calls of the batch interface for tests, for every type of soft values.
-#ifndef MORVIK_TESTS_BATCHES_H
-#define MORVIK_TESTS_BATCHES_H
+#ifndef MORVIK_TESTS_SUPPORT_BATCHES_H
+#define MORVIK_TESTS_SUPPORT_BATCHES_H
 
 #include <cstddef>
 #include <cstdint>
@@ -10,7 +10,7 @@
 #include "Blocks.h"
 #include "morvik_v1_0_batch.h"
 
-namespace blocks {
+namespace morvik::blocks {
 
 using State = veltra_ip_morvik_v1_0_state;
 using BatchOutputs = veltra_ip_morvik_v1_0_batch_outputs;
@@ -76,6 +76,6 @@ struct Decoded {
 template <class Input>
 Decoded decodedOneByOne(State* components, const Batch<Input>& batch, unsigned iterations, const std::uint32_t* tags);
 
-}  // namespace blocks
+}  // namespace morvik::blocks
 
 #endif

@@ -5,7 +5,7 @@
 #include <regex>
 #include <sstream>
 
-namespace support {
+namespace morvik::support {
 
 namespace {
 
@@ -87,4 +87,4 @@ void BerTest::expectRefused(const Arguments& arguments, const std::string& line)
     EXPECT_EQ(result.out, "");
 }
 
-}  // namespace support
+}  // namespace morvik::support

@@ -1,6 +1,6 @@
 // BerTest: what the tests of `morvik ber` share.
-#ifndef MORVIK_TESTS_BERTEST_H
-#define MORVIK_TESTS_BERTEST_H
+#ifndef MORVIK_TESTS_SUPPORT_BERTEST_H
+#define MORVIK_TESTS_SUPPORT_BERTEST_H
 
 #include <map>
 #include <string>
@@ -8,7 +8,7 @@
 
 #include "CommandTest.h"
 
-namespace support {
+namespace morvik::support {
 
 using Arguments = std::vector<std::string>;
 
@@ -38,6 +38,6 @@ protected:
     void expectRefused(const Arguments& arguments, const std::string& line) const;
 };
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -10,7 +10,7 @@
 
 #include "morvik_v1_0_batch.h"
 
-namespace blocks {
+namespace morvik::blocks {
 
 namespace {
 
@@ -176,4 +176,4 @@ Decoder::Result Decoder::decode(const Block& block, unsigned iterations, std::ui
     return {status, bits, outputs.tag};
 }
 
-}  // namespace blocks
+}  // namespace morvik::blocks

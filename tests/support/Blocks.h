@@ -1,6 +1,6 @@
 // Blocks: code blocks for tests, made from a seed, and a decoder to hand them to.
-#ifndef MORVIK_TESTS_BLOCKS_H
-#define MORVIK_TESTS_BLOCKS_H
+#ifndef MORVIK_TESTS_SUPPORT_BLOCKS_H
+#define MORVIK_TESTS_SUPPORT_BLOCKS_H
 
 #include <cstdint>
 #include <random>
@@ -9,7 +9,7 @@
 
 #include "morvik_v1_0_bitacc_cmodel.h"
 
-namespace blocks {
+namespace morvik::blocks {
 
 /// The same numbers on every machine: only the raw output of the generator is used.
 using Random = std::mt19937;
@@ -77,6 +77,6 @@ private:
     veltra_ip_morvik_v1_0_state* itsState;
 };
 
-}  // namespace blocks
+}  // namespace morvik::blocks
 
 #endif

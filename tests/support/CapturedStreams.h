@@ -1,6 +1,6 @@
 // CapturedStreams: collects what the library writes while it lives.
-#ifndef MORVIK_TESTS_CAPTUREDSTREAMS_H
-#define MORVIK_TESTS_CAPTUREDSTREAMS_H
+#ifndef MORVIK_TESTS_SUPPORT_CAPTUREDSTREAMS_H
+#define MORVIK_TESTS_SUPPORT_CAPTUREDSTREAMS_H
 
 #include <iostream>
 #include <sstream>

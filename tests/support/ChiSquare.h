@@ -1,6 +1,6 @@
 // ChiSquare: how well counts fit what is expected of them.
-#ifndef MORVIK_TESTS_CHISQUARE_H
-#define MORVIK_TESTS_CHISQUARE_H
+#ifndef MORVIK_TESTS_SUPPORT_CHISQUARE_H
+#define MORVIK_TESTS_SUPPORT_CHISQUARE_H
 
 #include <cmath>
 #include <cstddef>

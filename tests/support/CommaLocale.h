@@ -1,6 +1,6 @@
 // CommaLocale: a global locale in which numbers are written differently.
-#ifndef MORVIK_TESTS_COMMALOCALE_H
-#define MORVIK_TESTS_COMMALOCALE_H
+#ifndef MORVIK_TESTS_SUPPORT_COMMALOCALE_H
+#define MORVIK_TESTS_SUPPORT_COMMALOCALE_H
 
 #include <locale>
 #include <string>

@@ -9,7 +9,7 @@
 #include <stdexcept>
 #include <utility>
 
-namespace support {
+namespace morvik::support {
 
 namespace {
 
@@ -117,4 +117,4 @@ CommandResult CommandRunner::run(const std::vector<std::string>& arguments,
     return {status, output.empty() ? read(out) : std::string(), read(".err")};
 }
 
-}  // namespace support
+}  // namespace morvik::support

@@ -1,6 +1,6 @@
 // CommandRunner: runs a program as a user's shell would, and keeps what it printed.
-#ifndef MORVIK_TESTS_COMMANDRUNNER_H
-#define MORVIK_TESTS_COMMANDRUNNER_H
+#ifndef MORVIK_TESTS_SUPPORT_COMMANDRUNNER_H
+#define MORVIK_TESTS_SUPPORT_COMMANDRUNNER_H
 
 #include <sys/types.h>
 
@@ -9,7 +9,7 @@
 
 #include "TemporaryFolder.h"
 
-namespace support {
+namespace morvik::support {
 
 /// What a finished program leaves behind.
 struct CommandResult {
@@ -66,6 +66,6 @@ private:
     TemporaryFolder itsFolder;
 };
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

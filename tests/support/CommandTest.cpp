@@ -5,7 +5,7 @@
 #include <regex>
 #include <sstream>
 
-namespace support {
+namespace morvik::support {
 
 const std::string header = "block,rsc1_sys,rsc1_par,rsc2_par";
 const std::string zeroDecision = std::string(40, '0') + '\n';
@@ -59,4 +59,4 @@ CommandResult CommandTest::decode(const std::string& text, const std::vector<std
     return morvik.run(arguments);
 }
 
-}  // namespace support
+}  // namespace morvik::support

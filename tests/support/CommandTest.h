@@ -1,6 +1,6 @@
 // CommandTest: what the tests of the command share.
-#ifndef MORVIK_TESTS_COMMANDTEST_H
-#define MORVIK_TESTS_COMMANDTEST_H
+#ifndef MORVIK_TESTS_SUPPORT_COMMANDTEST_H
+#define MORVIK_TESTS_SUPPORT_COMMANDTEST_H
 
 #include <gtest/gtest.h>
 
@@ -10,7 +10,7 @@
 
 #include "CommandRunner.h"
 
-namespace support {
+namespace morvik::support {
 
 /// The first line of every file of soft values.
 extern const std::string header;
@@ -45,6 +45,6 @@ protected:
     const CommandRunner morvik;
 };
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -1,6 +1,6 @@
 // Configurations: every number of processing units with every algorithm type, for tests that run on all.
-#ifndef MORVIK_TESTS_CONFIGURATIONS_H
-#define MORVIK_TESTS_CONFIGURATIONS_H
+#ifndef MORVIK_TESTS_SUPPORT_CONFIGURATIONS_H
+#define MORVIK_TESTS_SUPPORT_CONFIGURATIONS_H
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 // Environment: numbers that choose another run of a test with random blocks.
-#ifndef MORVIK_TESTS_ENVIRONMENT_H
-#define MORVIK_TESTS_ENVIRONMENT_H
+#ifndef MORVIK_TESTS_SUPPORT_ENVIRONMENT_H
+#define MORVIK_TESTS_SUPPORT_ENVIRONMENT_H
 
 #include <cstdlib>
 

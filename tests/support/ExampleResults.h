@@ -1,12 +1,12 @@
 // ExampleResults: rows of result files for tests.
-#ifndef MORVIK_TESTS_EXAMPLERESULTS_H
-#define MORVIK_TESTS_EXAMPLERESULTS_H
+#ifndef MORVIK_TESTS_SUPPORT_EXAMPLERESULTS_H
+#define MORVIK_TESTS_SUPPORT_EXAMPLERESULTS_H
 
 #include <cstdint>
 
 #include "simulation/Results.h"
 
-namespace support {
+namespace morvik::support {
 
 /// A row of K = 40 at so many thousandths of a decibel, of which the frames with a number divisible by 10 have failed
 /// with 7 wrong bits.
@@ -26,6 +26,6 @@ inline simulation::ResultRow exampleRow(std::size_t number, int milliDecibels, s
     return row;
 }
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

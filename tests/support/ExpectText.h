@@ -1,6 +1,6 @@
 // ExpectText: compares a text with what is expected of it, line by line.
-#ifndef MORVIK_TESTS_EXPECTTEXT_H
-#define MORVIK_TESTS_EXPECTTEXT_H
+#ifndef MORVIK_TESTS_SUPPORT_EXPECTTEXT_H
+#define MORVIK_TESTS_SUPPORT_EXPECTTEXT_H
 
 #include <string>
 

@@ -1,6 +1,6 @@
 // FailingAllocation: makes a single allocation fail, for programs whose malloc and free are wrapped by the linker.
-#ifndef MORVIK_TESTS_FAILINGALLOCATION_H
-#define MORVIK_TESTS_FAILINGALLOCATION_H
+#ifndef MORVIK_TESTS_SUPPORT_FAILINGALLOCATION_H
+#define MORVIK_TESTS_SUPPORT_FAILINGALLOCATION_H
 
 #include <iostream>
 #include <streambuf>

@@ -1,6 +1,6 @@
 // FailureBlock: what the tests of failing allocations decode.
-#ifndef MORVIK_TESTS_FAILUREBLOCK_H
-#define MORVIK_TESTS_FAILUREBLOCK_H
+#ifndef MORVIK_TESTS_SUPPORT_FAILUREBLOCK_H
+#define MORVIK_TESTS_SUPPORT_FAILUREBLOCK_H
 
 #include <cstdint>
 #include <vector>

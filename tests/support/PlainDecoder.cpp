@@ -8,7 +8,7 @@
 
 #include "QppTable.h"
 
-namespace plain {
+namespace morvik::plain {
 
 namespace {
 
@@ -320,4 +320,4 @@ std::optional<Result> decode(const std::vector<int>& sys,
     return BlockDecoder(*cut, constituents(sys, par1, par2), algorithm).decode(iterations);
 }
 
-}  // namespace plain
+}  // namespace morvik::plain

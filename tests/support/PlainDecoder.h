@@ -1,13 +1,13 @@
 // A second formulation of the whole LTE decoder, window by window from the flow of the border metrics: for checking.
-#ifndef MORVIK_TESTS_PLAINDECODER_H
-#define MORVIK_TESTS_PLAINDECODER_H
+#ifndef MORVIK_TESTS_SUPPORT_PLAINDECODER_H
+#define MORVIK_TESTS_SUPPORT_PLAINDECODER_H
 
 #include <optional>
 #include <vector>
 
 #include "PlainTrellis.h"
 
-namespace plain {
+namespace morvik::plain {
 
 bool knownBlockSize(unsigned K);
 
@@ -51,6 +51,6 @@ std::optional<Result> decode(const std::vector<int>& sys,
                              unsigned algorithm,
                              unsigned iterations);
 
-}  // namespace plain
+}  // namespace morvik::plain
 
 #endif

@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <cmath>
 
-namespace plain {
+namespace morvik::plain {
 
 namespace {
 
@@ -203,4 +203,4 @@ int logLikelihoodRatio(
     return wrap16(bestPath(a, b, g, 1, decide) - bestPath(a, b, g, 0, decide));
 }
 
-}  // namespace plain
+}  // namespace morvik::plain

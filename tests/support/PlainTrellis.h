@@ -1,12 +1,12 @@
 // The constituent code's trellis and kernels, computed plainly from the encoder's shift register: for checking.
-#ifndef MORVIK_TESTS_PLAINTRELLIS_H
-#define MORVIK_TESTS_PLAINTRELLIS_H
+#ifndef MORVIK_TESTS_SUPPORT_PLAINTRELLIS_H
+#define MORVIK_TESTS_SUPPORT_PLAINTRELLIS_H
 
 #include <array>
 #include <cstddef>
 #include <vector>
 
-namespace plain {
+namespace morvik::plain {
 
 // All metrics are 16-bit values held in ints, aligned as the state format of 12 bits with 3 fraction bits (Fix_12_3)
 // aligns them: in multiples of 16.
@@ -60,6 +60,6 @@ std::vector<Column> backward(const std::vector<BranchColumn>& g,
 int logLikelihoodRatio(
     const Column& a, const Column& b, const BranchColumn& g, Decision rule, const std::vector<int>& table);
 
-}  // namespace plain
+}  // namespace morvik::plain
 
 #endif

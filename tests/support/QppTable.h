@@ -1,10 +1,10 @@
 // The 188 block sizes of the LTE turbo code and the coefficients of their permutation polynomials.
-#ifndef MORVIK_TESTS_QPPTABLE_H
-#define MORVIK_TESTS_QPPTABLE_H
+#ifndef MORVIK_TESTS_SUPPORT_QPPTABLE_H
+#define MORVIK_TESTS_SUPPORT_QPPTABLE_H
 
 #include <array>
 
-namespace plain {
+namespace morvik::plain {
 
 struct QppParameters {
     unsigned K;
@@ -65,6 +65,6 @@ inline constexpr std::array<QppParameters, 188> qppTable = {{
 }};
 // clang-format on
 
-}  // namespace plain
+}  // namespace morvik::plain
 
 #endif

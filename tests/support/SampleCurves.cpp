@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <cmath>
 
-namespace support {
+namespace morvik::support {
 
 namespace {
 
@@ -91,4 +91,4 @@ std::vector<report::Curve> iterationCurves(unsigned iterations, const std::vecto
     return report::curvesOf(rows);
 }
 
-}  // namespace support
+}  // namespace morvik::support

@@ -1,12 +1,12 @@
 // SampleCurves: made-up error rates for the tests of plots and pages, with everything in them that is drawn.
-#ifndef MORVIK_TESTS_SAMPLECURVES_H
-#define MORVIK_TESTS_SAMPLECURVES_H
+#ifndef MORVIK_TESTS_SUPPORT_SAMPLECURVES_H
+#define MORVIK_TESTS_SUPPORT_SAMPLECURVES_H
 
 #include <vector>
 
 #include "report/Curves.h"
 
-namespace support {
+namespace morvik::support {
 
 /// Two curves that fall as those of a block of 512 bits do, each ending in a point without errors, and a reference,
 /// which has no confidence intervals.
@@ -18,6 +18,6 @@ std::vector<report::Curve> hostileCurves();
 /// The samples after each of `iterations` iterations, at some Eb/N0.
 std::vector<report::Curve> iterationCurves(unsigned iterations, const std::vector<double>& decibels);
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -1,6 +1,6 @@
 // SamplerForms: for tests that run with every sampler form of this machine.
-#ifndef MORVIK_TESTS_SAMPLERFORMS_H
-#define MORVIK_TESTS_SAMPLERFORMS_H
+#ifndef MORVIK_TESTS_SUPPORT_SAMPLERFORMS_H
+#define MORVIK_TESTS_SUPPORT_SAMPLERFORMS_H
 
 #include <gtest/gtest.h>
 

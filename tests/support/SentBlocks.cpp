@@ -4,7 +4,7 @@
 #include <fstream>
 #include <sstream>
 
-namespace blocks {
+namespace morvik::blocks {
 
 const std::vector<std::string>& sentBlockNames()
 {
@@ -38,4 +38,4 @@ std::vector<SentBlock> readSentBlocks(const std::string& name)
     return blocks;
 }
 
-}  // namespace blocks
+}  // namespace morvik::blocks

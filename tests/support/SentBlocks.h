@@ -1,13 +1,13 @@
 // SentBlocks: the blocks of tests/data/vectors, which another encoder made, with the bits that were sent.
-#ifndef MORVIK_TESTS_SENTBLOCKS_H
-#define MORVIK_TESTS_SENTBLOCKS_H
+#ifndef MORVIK_TESTS_SUPPORT_SENTBLOCKS_H
+#define MORVIK_TESTS_SUPPORT_SENTBLOCKS_H
 
 #include <string>
 #include <vector>
 
 #include "Blocks.h"
 
-namespace blocks {
+namespace morvik::blocks {
 
 struct SentBlock {
     Block soft;
@@ -19,6 +19,6 @@ const std::vector<std::string>& sentBlockNames();
 
 std::vector<SentBlock> readSentBlocks(const std::string& name);
 
-}  // namespace blocks
+}  // namespace morvik::blocks
 
 #endif

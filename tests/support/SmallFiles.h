@@ -1,11 +1,11 @@
 // SmallFiles: what a full disk is to a process.
-#ifndef MORVIK_TESTS_SMALLFILES_H
-#define MORVIK_TESTS_SMALLFILES_H
+#ifndef MORVIK_TESTS_SUPPORT_SMALLFILES_H
+#define MORVIK_TESTS_SUPPORT_SMALLFILES_H
 
 #include <signal.h>
 #include <sys/resource.h>
 
-namespace support {
+namespace morvik::support {
 
 /// Files of this process can have so many bytes for as long as it lives, as if the disk were full then.
 class SmallFiles {
@@ -31,6 +31,6 @@ private:
     rlimit itsOld = {};
 };
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

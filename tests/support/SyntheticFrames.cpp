@@ -3,9 +3,9 @@
 
 #include <gtest/gtest.h>
 
-namespace support {
+namespace morvik::support {
 
-using namespace simulation;
+using namespace morvik::simulation;
 
 std::uint32_t SyntheticFrames::wrongBits(std::uint64_t frame, std::size_t count) const
 {
@@ -65,4 +65,4 @@ void expectEqual(const Tally& got, const Tally& expected)
     }
 }
 
-}  // namespace support
+}  // namespace morvik::support

@@ -1,7 +1,7 @@
 // SyntheticFrames: frames whose errors follow from their numbers, without a decoder; and what counting them one at a
 // time gives, which is the definition of what counts at a point.
-#ifndef MORVIK_TESTS_SYNTHETICFRAMES_H
-#define MORVIK_TESTS_SYNTHETICFRAMES_H
+#ifndef MORVIK_TESTS_SUPPORT_SYNTHETICFRAMES_H
+#define MORVIK_TESTS_SUPPORT_SYNTHETICFRAMES_H
 
 #include <cstddef>
 #include <cstdint>
@@ -11,7 +11,7 @@
 #include "simulation/Tally.h"
 #include "simulation/Workers.h"
 
-namespace support {
+namespace morvik::support {
 
 class SyntheticFrames {
 public:
@@ -36,6 +36,6 @@ simulation::Tally countOneByOne(const SyntheticFrames& frames,
 
 void expectEqual(const simulation::Tally& got, const simulation::Tally& expected);
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -10,7 +10,7 @@
 #include <stdexcept>
 #include <system_error>
 
-namespace support {
+namespace morvik::support {
 
 TemporaryFolder::TemporaryFolder()
 {
@@ -64,4 +64,4 @@ std::vector<std::string> TemporaryFolder::names() const
     return names;
 }
 
-}  // namespace support
+}  // namespace morvik::support

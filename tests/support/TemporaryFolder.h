@@ -1,11 +1,11 @@
 // TemporaryFolder: a folder of its own for a test.
-#ifndef MORVIK_TESTS_TEMPORARYFOLDER_H
-#define MORVIK_TESTS_TEMPORARYFOLDER_H
+#ifndef MORVIK_TESTS_SUPPORT_TEMPORARYFOLDER_H
+#define MORVIK_TESTS_SUPPORT_TEMPORARYFOLDER_H
 
 #include <string>
 #include <vector>
 
-namespace support {
+namespace morvik::support {
 
 /// An empty folder, which goes with the object and all that is in it.
 class TemporaryFolder {
@@ -30,6 +30,6 @@ private:
     std::string itsPath;
 };
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -9,7 +9,7 @@
 #include "simulation/Error.h"
 #include "simulation/Shown.h"
 
-namespace support {
+namespace morvik::support {
 
 namespace {
 
@@ -132,4 +132,4 @@ void TraceReader::readRow(TraceStep& step) const
     }
 }
 
-}  // namespace support
+}  // namespace morvik::support

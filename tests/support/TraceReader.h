@@ -1,6 +1,6 @@
 // TraceReader: the values in the text that the model traces.
-#ifndef MORVIK_TESTS_TRACEREADER_H
-#define MORVIK_TESTS_TRACEREADER_H
+#ifndef MORVIK_TESTS_SUPPORT_TRACEREADER_H
+#define MORVIK_TESTS_SUPPORT_TRACEREADER_H
 
 #include <array>
 #include <cstddef>
@@ -10,7 +10,7 @@
 #include <string>
 #include <string_view>
 
-namespace support {
+namespace morvik::support {
 
 /// The signals of a trellis step in the order of the trace: intrinsic value, forward and backward metrics, elements 4
 /// to 7 of the branch metric column, log-likelihood ratio, extrinsic value.
@@ -53,6 +53,6 @@ private:
     std::optional<TraceStep> itsPass;  // the pass, and the step of its next row
 };
 
-}  // namespace support
+}  // namespace morvik::support
 
 #endif

@@ -1,6 +1,6 @@
 // Decoder: decodes batches on several threads, with a state of the C interface for each.
-#ifndef MORVIK_PYTHON_DECODER_H
-#define MORVIK_PYTHON_DECODER_H
+#ifndef MORVIK_BINDINGS_PYTHON_MODULE_DECODER_H
+#define MORVIK_BINDINGS_PYTHON_MODULE_DECODER_H
 
 #include <array>
 #include <cstdint>

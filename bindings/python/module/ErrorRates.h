@@ -1,6 +1,6 @@
 // ErrorRates: simulations of error rates in this process, on threads.
-#ifndef MORVIK_PYTHON_ERRORRATES_H
-#define MORVIK_PYTHON_ERRORRATES_H
+#ifndef MORVIK_BINDINGS_PYTHON_MODULE_ERRORRATES_H
+#define MORVIK_BINDINGS_PYTHON_MODULE_ERRORRATES_H
 
 #include <functional>
 #include <string>

@@ -2,8 +2,8 @@
 //
 // The module is linked from the library's objects, with this unit in the place of src/MessageStreams.cpp. Each thread
 // has streams of its own, so that a message always belongs to the call that caused it.
-#ifndef MORVIK_PYTHON_THREADMESSAGES_H
-#define MORVIK_PYTHON_THREADMESSAGES_H
+#ifndef MORVIK_BINDINGS_PYTHON_MODULE_THREADMESSAGES_H
+#define MORVIK_BINDINGS_PYTHON_MODULE_THREADMESSAGES_H
 
 #include <string>
 #include <vector>

@@ -16,9 +16,9 @@
 #include "link/Channel.h"
 #include "link/DefaultScale.h"
 #include "link/TurboEncoder.h"
+#include "rules/BlockSizes.h"
 #include "simulation/Error.h"
 #include "simulation/Thousandths.h"
-#include "standard/BlockSizes.h"
 
 namespace py = pybind11;
 using namespace morvik::python;
@@ -221,32 +221,32 @@ void addLink(py::module_& module)
 // ---- Simulation
 
 /// Named as the columns of result files.
-py::dict fields(const simulation::ResultRow& row)
+py::dict fields(const morvik::simulation::ResultRow& row)
 {
-    const simulation::Bounds bits = simulation::bitErrorBounds(row);
-    const simulation::Bounds blocks = simulation::blockErrorBounds(row);
+    const morvik::simulation::Bounds bits = morvik::simulation::bitErrorBounds(row);
+    const morvik::simulation::Bounds blocks = morvik::simulation::blockErrorBounds(row);
     py::dict fields;
     fields["point"] = row.pointNumber;
     fields["block_size"] = row.point.blockSize;
     fields["num_pu"] = row.point.numPu;
-    fields["algorithm"] = simulation::algorithmName(row.point.algorithm);
-    fields["scale_option"] = simulation::scaleOptionText(row.point.scaleOption);
+    fields["algorithm"] = morvik::simulation::algorithmName(row.point.algorithm);
+    fields["scale_option"] = morvik::simulation::scaleOptionText(row.point.scaleOption);
     fields["iterations"] = row.point.iterations;
-    fields["ebn0_db"] = simulation::fromThousandths(row.point.milliDecibels);
-    fields["scale"] = simulation::fromThousandths(row.point.milliScale);
+    fields["ebn0_db"] = morvik::simulation::fromThousandths(row.point.milliDecibels);
+    fields["scale"] = morvik::simulation::fromThousandths(row.point.milliScale);
     fields["frames"] = row.frames.text();
     fields["blocks"] = row.frames.size();
     fields["bit_errors"] = row.errors.bitErrors;
     fields["block_errors"] = row.errors.blockErrors;
     fields["bit_error_squares"] = row.errors.bitErrorSquares;
-    fields["ber"] = simulation::bitErrorRate(row);
+    fields["ber"] = morvik::simulation::bitErrorRate(row);
     fields["ber_low"] = bits.low;
     fields["ber_high"] = bits.high;
-    fields["bler"] = simulation::blockErrorRate(row);
+    fields["bler"] = morvik::simulation::blockErrorRate(row);
     fields["bler_low"] = blocks.low;
     fields["bler_high"] = blocks.high;
     fields["clipped_values"] = row.clipped;
-    fields["clipped_fraction"] = simulation::clippedFraction(row);
+    fields["clipped_fraction"] = morvik::simulation::clippedFraction(row);
     fields["failed_frames"] = py::tuple(py::cast(row.errors.failures));
     fields["seconds"] = row.seconds;
     fields["seed"] = row.seed;
@@ -254,10 +254,10 @@ py::dict fields(const simulation::ResultRow& row)
     return fields;
 }
 
-py::list fieldsOf(const std::vector<simulation::ResultRow>& rows)
+py::list fieldsOf(const std::vector<morvik::simulation::ResultRow>& rows)
 {
     py::list list;
-    for (const simulation::ResultRow& row : rows) {
+    for (const morvik::simulation::ResultRow& row : rows) {
         list.append(fields(row));
     }
     return list;
@@ -273,29 +273,29 @@ Listeners listenersOf(const py::object& progress)
             throw py::error_already_set();
         }
     };
-    listeners.hasEnded = [&progress](const std::vector<simulation::ResultRow>& rows) {
+    listeners.hasEnded = [&progress](const std::vector<morvik::simulation::ResultRow>& rows) {
         const py::gil_scoped_acquire locked;
         progress(fieldsOf(rows));
     };
     return listeners;
 }
 
-py::list simulate(const simulation::Sweep& sweep,
-                  const simulation::StopRules& rules,
+py::list simulate(const morvik::simulation::Sweep& sweep,
+                  const morvik::simulation::StopRules& rules,
                   bool eachIteration,
                   std::uint64_t seed,
                   unsigned threads,
                   const std::string& instructionSet,
                   const py::object& progress)
 {
-    simulation::Plan plan;
-    plan.points = simulation::pointsOf(sweep);
+    morvik::simulation::Plan plan;
+    plan.points = morvik::simulation::pointsOf(sweep);
     plan.eachIteration = eachIteration;
     plan.rules = rules;
     plan.seed = seed;
     plan.version = MORVIK_VERSION;
     const Listeners listeners = listenersOf(progress);
-    std::vector<simulation::ResultRow> rows;
+    std::vector<morvik::simulation::ResultRow> rows;
     {
         const Unlocked unlocked;
         rows = errorRates(plan, threads, instructionSet, listeners);
@@ -305,21 +305,21 @@ py::list simulate(const simulation::Sweep& sweep,
 
 void addSimulation(py::module_& module)
 {
-    py::class_<simulation::Sweep>(module, "Sweep")
+    py::class_<morvik::simulation::Sweep>(module, "Sweep")
         .def(py::init<>())
-        .def_readwrite("block_sizes", &simulation::Sweep::blockSizes)
-        .def_readwrite("num_pus", &simulation::Sweep::numPus)
-        .def_readwrite("algorithms", &simulation::Sweep::algorithms)
-        .def_readwrite("milli_scales", &simulation::Sweep::scaleOptions)
-        .def_readwrite("iterations", &simulation::Sweep::iterations)
-        .def_readwrite("milli_decibels", &simulation::Sweep::milliDecibels);
-    py::class_<simulation::StopRules>(module, "StopRules")
+        .def_readwrite("block_sizes", &morvik::simulation::Sweep::blockSizes)
+        .def_readwrite("num_pus", &morvik::simulation::Sweep::numPus)
+        .def_readwrite("algorithms", &morvik::simulation::Sweep::algorithms)
+        .def_readwrite("milli_scales", &morvik::simulation::Sweep::scaleOptions)
+        .def_readwrite("iterations", &morvik::simulation::Sweep::iterations)
+        .def_readwrite("milli_decibels", &morvik::simulation::Sweep::milliDecibels);
+    py::class_<morvik::simulation::StopRules>(module, "StopRules")
         .def(py::init<>())
-        .def_readwrite("block_errors", &simulation::StopRules::blockErrors)
-        .def_readwrite("bit_errors", &simulation::StopRules::bitErrors)
-        .def_readwrite("max_blocks", &simulation::StopRules::maxBlocks)
-        .def_readwrite("max_seconds", &simulation::StopRules::maxSeconds)
-        .def_readwrite("stop_bler", &simulation::StopRules::stopBler);
+        .def_readwrite("block_errors", &morvik::simulation::StopRules::blockErrors)
+        .def_readwrite("bit_errors", &morvik::simulation::StopRules::bitErrors)
+        .def_readwrite("max_blocks", &morvik::simulation::StopRules::maxBlocks)
+        .def_readwrite("max_seconds", &morvik::simulation::StopRules::maxSeconds)
+        .def_readwrite("stop_bler", &morvik::simulation::StopRules::stopBler);
     module.def("error_rate",
                simulate,
                py::arg("sweep"),

@@ -1,0 +1,127 @@
+// Doctor: the subcommand that tells why blocks decode badly.
+#include "Doctor.h"
+
+#include <cstdint>
+#include <iostream>
+#include <memory>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "Arguments.h"
+#include "DecoderOptions.h"
+#include "Files.h"
+#include "Notice.h"
+#include "ReferenceBits.h"
+#include "SoftValueReader.h"
+#include "hardware/diagnosis/Diagnosis.h"
+#include "hardware/diagnosis/DiagnosisText.h"
+#include "rules/BlockSizes.h"
+
+namespace morvik {
+
+namespace {
+
+constexpr int noMistakeFound = 3;  // an exit status of this subcommand alone
+
+struct Options {
+    std::string input = standardStream;
+    std::string reference;
+    std::uint32_t blocks = 16;
+    bool json = false;
+    DecoderOptions decoder;
+};
+
+void check(const doctor::Case& read, const SoftValueReader& blocks, const ReferenceBits& reference)
+{
+    const std::size_t K = read.sent.size();
+    if (standard::findBlockSize(static_cast<std::uint32_t>(K)) == nullptr) {
+        reference.fail(std::to_string(K) + " bits, allowed are the block sizes of 3GPP TS 36.212 (40 to 6144)");
+    }
+    if (read.received.size() < K) {
+        blocks.failBlock("block of " + std::to_string(read.received.size()) + " rows for " + std::to_string(K) +
+                         " bits, expected " + std::to_string(K + 4));
+    }
+}
+
+/// The cases to look at.
+struct Cases {
+    std::vector<doctor::Case> cases;
+    bool hasMore = false;  ///< the file has more blocks
+};
+
+Cases readCases(const Options& options)
+{
+    InputFile input(options.input);
+    InputFile referenceFile(options.reference);
+    SoftValueReader blocks(input.stream(), input.name());
+    ReferenceBits reference(referenceFile.stream(), referenceFile.name());
+    std::vector<doctor::Case> cases;
+    SoftBlock received;
+    while (cases.size() < options.blocks && blocks.next(received)) {
+        doctor::Case read{received, {}};
+        read.sent = reference.next();
+        check(read, blocks, reference);
+        cases.push_back(std::move(read));
+    }
+    if (!blocks.hasMore()) {
+        reference.expectEnd();
+    }
+    return {std::move(cases), blocks.hasMore()};
+}
+
+int examine(const Options& options)
+{
+    base::expectOwnFile(standardStream, {options.input, options.reference}, "findings");
+    const Cases read = readCases(options);
+    doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
+    diagnosis.hasMore = read.hasMore;
+    const std::string core = coreLine(options.decoder.generics, options.decoder.iterations);
+    print(options.json ? jsonOf(diagnosis) : core + textOf(diagnosis));
+    switch (diagnosis.verdict) {
+    case doctor::Verdict::healthy:
+        return success;
+    case doctor::Verdict::mistaken:
+    case doctor::Verdict::careless:
+        return differencesFound;
+    default:
+        return diagnosis.verdict != doctor::Verdict::unrelated && diagnosis.best.mistakes.count() > 0 ? differencesFound
+                                                                                                      : noMistakeFound;
+    }
+}
+
+}  // namespace
+
+Command addDoctor(CLI::App& app)
+{
+    CLI::App* command = app.add_subcommand("doctor", "Tell why blocks of soft values decode badly");
+    const auto options = std::make_shared<Options>();
+
+    command->add_option("FILE", options->input, "Soft values, as 'morvik decode' takes them; - for standard input")
+        ->type_name("")
+        ->capture_default_str();
+    command->add_option("--reference", options->reference, "The bits that were sent, one line for each block")
+        ->type_name("FILE")
+        ->required();
+    command->add_option("--blocks", options->blocks, "Look at the first N blocks")
+        ->transform(integerFrom(1, 1000))
+        ->type_name("N")
+        ->capture_default_str();
+    command->add_flag("--json", options->json, "Print a JSON object instead of text");
+    addDecoderOptions(*command, options->decoder);
+    command->footer(R"(Looks for a flipped sign, swapped columns, another order of the tail, rows or bits in reversed
+order, a missing or doubled scale, and missing or additional rows, by themselves and together.
+
+Exit status: 0 all blocks decode and nothing is wrong, 1 a mistake was found, 2 bad input or usage,
+3 blocks fail and no mistake was found: they are too noisy, or the bits are not theirs.
+
+Example:
+  morvik doctor received.csv --reference sent.bits)");
+
+    const auto run = [options] {
+        return examine(*options);
+    };
+    return {command, run};
+}
+
+}  // namespace morvik

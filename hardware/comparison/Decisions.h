@@ -1,0 +1,86 @@
+// Decisions: the trellis steps of rules/Trellis.h by each algorithm, and with the mistakes that hardware may have in
+// it.
+#ifndef MORVIK_HARDWARE_COMPARISON_DECISIONS_H
+#define MORVIK_HARDWARE_COMPARISON_DECISIONS_H
+
+#include <array>
+#include <cstdint>
+
+#include "rules/Trellis.h"
+#include "rules/TrellisDecision.h"
+
+namespace morvik::comparison {
+
+/// A metric of hardware that saturates where the core wraps.
+struct Held {
+    std::int16_t value = 0;
+};
+
+constexpr Held held(int value)
+{
+    return {static_cast<std::int16_t>(arithmetic::clip(value, -32768, 32752))};  // -2048 and 2047 steps
+}
+
+constexpr Held addWrap(Held a, Held b)
+{
+    return held(a.value + b.value);
+}
+
+constexpr Held subWrap(Held a, Held b)
+{
+    return held(a.value - b.value);
+}
+
+constexpr Held select(Held difference, Held c1, Held c2)
+{
+    return difference.value < 0 ? c2 : c1;
+}
+
+constexpr Held maxWrap(Held c1, Held c2)
+{
+    return c1.value < c2.value ? c2 : c1;
+}
+
+/// A value type and aligned words, there and back.
+template <class Value>
+Value fromWord(std::int16_t word)
+{
+    return Value{word};
+}
+
+constexpr std::int16_t wordOf(std::int16_t value)
+{
+    return value;
+}
+
+constexpr std::int16_t wordOf(Held value)
+{
+    return value.value;
+}
+
+/// The table of TCalculationEngineModBase::createLUT, called with a decision difference. Words of narrower registers
+/// are shifted up by the bits that those lack.
+template <class Value>
+struct Corrections {
+    const unsigned char* middle;
+    unsigned shift = 0;
+
+    Value operator()(Value difference) const
+    {
+        return fromWord<Value>(static_cast<std::int16_t>(middle[wordOf(difference) >> shift] << shift));
+    }
+};
+
+template <class Value, std::size_t count>
+std::array<Value, count> fromWords(const std::array<std::int16_t, count>& words)
+{
+    std::array<Value, count> values{};
+    for (std::size_t i = 0; i < count; ++i) {
+        values[i] = fromWord<Value>(words[i]);
+    }
+    return values;
+}
+
+}  // namespace morvik::comparison
+
+#endif

@@ -1,0 +1,140 @@
+// Replay: single operations of the core, repeated on the values of a dump.
+#ifndef MORVIK_HARDWARE_COMPARISON_REPLAY_H
+#define MORVIK_HARDWARE_COMPARISON_REPLAY_H
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <vector>
+
+#include "Model.h"
+#include "Values.h"
+
+namespace morvik::comparison {
+
+/// A mistake in an operation, by which it gives other values than the core's.
+struct Mistake {
+    enum Kind : std::uint8_t {
+        none,
+        aprioriMissing,       ///< intrinsic values from the systematic ones alone
+        aprioriOfPassBefore,  ///< extrinsic values of the pass before the last one
+        aprioriUnpermuted,    ///< extrinsic values in the order of the other code
+        aprioriInverse,       ///< by the permutation that leads to the other code
+        aprioriBefore,        ///< by the interleaver's address for the step before
+        aprioriBehind,
+        systematicUnpermuted,  ///< systematic values in the natural order, on the interleaved code
+        intrinsicWrapped,      ///< the sum cut to eight bits before it is halved
+        intrinsicClipped,      ///< the sum clipped to eight bits before it is halved
+        parityOfOtherCode,
+        parityNegated,
+        negationWrapped,    ///< the parity negated in eight bits, where -128 stays -128
+        doubledWrapped,     ///< twice the intrinsic value cut to eight bits
+        doubledClipped,     ///< twice the intrinsic value clipped to eight bits
+        unclipped,          ///< branch metrics and extrinsic values wider than eight bits
+        clippedTo,          ///< `number` bits
+        clippedSymmetric,   ///< to -127 and 127
+        wrappedTo,          ///< their low `number` bits
+        unwrapped,          ///< metrics and ratios held at the ends of their range
+        ratioHeld,          ///< the last difference of the ratio alone held there
+        storedIn,           ///< metrics and ratios cut to `number` bits once they are decided
+        computedIn,         ///< in registers and adders of `number` bits
+        borderMask,         ///< border columns ANDed with `number`, in steps
+        borderUnknown,      ///< border columns of zeros
+        borderOfThisPass,   ///< where those of the last pass are right
+        borderOfLastPass,   ///< where those of this pass are right
+        borderOfOtherCode,  ///< of the pass before, over the other code
+        borderLate,         ///< those that were right in the last pass over the code
+        borderOfFirstPass,  ///< over the code, never renewed
+        tailClipped,        ///< the branch sums of the tail clipped like branch metrics
+        unscaled,           ///< extrinsic values not multiplied by 0.75
+        uncorrected,        ///< decisions without the correction table
+        correctedAtOnce,    ///< corrections added to their own decision, not to the next
+    };
+
+    constexpr Mistake(Kind what = none, int size = 0) : kind(what), number(size) {}
+
+    friend constexpr bool operator==(const Mistake& mistake, Kind asked)
+    {
+        return mistake.kind == asked;
+    }
+
+    friend constexpr bool operator!=(const Mistake& mistake, Kind asked)
+    {
+        return mistake.kind != asked;
+    }
+
+    Kind kind;
+    int number;
+};
+
+/// What an operation gives, in steps of the state metrics' format.
+struct Column {
+    std::array<std::int16_t, 8> values = {};  ///< of the stage's signals
+    bool complete = true;                     ///< whether all inputs are in the dump
+};
+
+/// Takes the inputs of an operation from the dump, and from the model those that the dump lacks. So a value that
+/// merely follows from a wrong one is as expected here.
+class Replay {
+public:
+    /// Both outlive the replay.
+    Replay(const Model& model, const Values& dump);
+
+    /// All signals of a stage at a trellis step.
+    Column column(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake = {}) const;
+
+    /// What intrinsic and extrinsic values lose: equal for two values of a stage when every way to round treats them
+    /// alike, 0 where nothing is lost.
+    unsigned roundingClass(unsigned pass, Stage stage, unsigned trellisStep) const;
+
+private:
+    using Metrics = std::array<std::int16_t, 8>;  // aligned words
+    using Branches = std::array<std::int16_t, 4>;
+
+    std::int16_t input(const Place& place, bool& complete) const;
+    template <class Aligned>
+    Aligned inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& complete) const;
+
+    /// The step of the pass before whose extrinsic value a step takes.
+    unsigned aprioriStep(unsigned code, unsigned trellisStep, Mistake mistake) const;
+    int twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const;
+
+    struct TwiceIntrinsic {
+        int value;
+        bool isSure;  ///< of the bit below a step, which a dump lacks: whether it follows from the dump's own values
+    };
+
+    TwiceIntrinsic twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const;
+    bool isInDump(unsigned pass, Stage stage, unsigned trellisStep, const Column& column) const;
+    /// What `compute` makes of twice an intrinsic value; where that is not sure, what the dump has, if either makes it.
+    template <class Compute>
+    Column fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisStep, Compute compute) const;
+    bool givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const;
+    /// 3x / 4 or x, not yet narrowed to eight bits (rule 14).
+    int wideExtrinsicValue(int ratio, int twice, Mistake mistake) const;
+    int extrinsicValue(int ratio, int twice, Mistake mistake) const;
+    Branches branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const;
+    /// The column to which a recursion comes from the step `from`. `hasEarlier` tells whether it came there from
+    /// another step, whose decisions may have left corrections pending.
+    Metrics reached(unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, bool& complete) const;
+    Metrics forwardStart(unsigned pass, unsigned segment, Mistake mistake, bool& complete) const;
+    Metrics backwardStart(unsigned pass, const Window& window, Mistake mistake, bool& complete) const;
+    Metrics tail(unsigned pass, Mistake mistake) const;
+    /// The pass that leaves the column from which a segment or window starts; nothing where the state is unknown.
+    static std::optional<unsigned> borderPass(unsigned pass, bool ofThisPass, Mistake mistake);
+
+    Column intrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column branchColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column backwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+    Column extrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
+
+    const Model& itsModel;
+    const Values& itsDump;
+    std::vector<unsigned char> itsCorrections;  // of each decision difference, from -32768
+};
+
+}  // namespace morvik::comparison
+
+#endif

@@ -1,0 +1,134 @@
+// Values: the values of all signals in all passes over a block.
+#ifndef MORVIK_HARDWARE_COMPARISON_VALUES_H
+#define MORVIK_HARDWARE_COMPARISON_VALUES_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "hardware/testbench/Passes.h"
+
+namespace morvik::comparison {
+
+/// The operations of a pass, in their order.
+enum class Stage : std::uint8_t { intrinsic, branch, forward, backward, ratio, extrinsic };
+
+constexpr std::array<Stage, 6> stages = {
+    Stage::intrinsic, Stage::branch, Stage::forward, Stage::backward, Stage::ratio, Stage::extrinsic};
+
+constexpr unsigned signalCount = passSignals.size();
+
+/// The signals of a stage in passSignals.
+struct SignalRange {
+    unsigned first;
+    unsigned count;
+};
+
+constexpr SignalRange signalsOf(Stage stage)
+{
+    constexpr std::array<SignalRange, 6> ranges = {{{0, 1}, {1, 4}, {5, 8}, {13, 8}, {21, 1}, {22, 1}}};
+    return ranges[static_cast<std::size_t>(stage)];
+}
+
+constexpr Stage stageOf(unsigned signal)
+{
+    Stage found = Stage::intrinsic;
+    for (const Stage stage : stages) {
+        if (signalsOf(stage).first <= signal) {
+            found = stage;
+        }
+    }
+    return found;
+}
+
+/// The branch metric that always equals this one, as the code has one parity bit for each data bit (rule 5): g3 is g0,
+/// and g2 is g1. Other signals have none and are returned.
+constexpr unsigned twinOf(unsigned signal)
+{
+    const SignalRange branch = signalsOf(Stage::branch);
+    return stageOf(signal) == Stage::branch ? 2 * branch.first + branch.count - 1 - signal : signal;
+}
+
+/// A value of a block: half-iteration, signal, trellis step.
+struct Place {
+    unsigned pass;
+    unsigned signal;
+    unsigned step;
+};
+
+/// Values in steps of the state metrics' format: 12 bits, eighths of 1.
+class Values {
+public:
+    static constexpr std::int16_t smallest = -2048;
+    static constexpr std::int16_t largest = 2047;
+    static constexpr std::int16_t missing = INT16_MIN;
+    static constexpr std::int16_t unknown = INT16_MIN + 1;  ///< x where there should be a value
+
+    Values(unsigned passes, unsigned steps)
+        : itsPasses(passes), itsSteps(steps), itsValues(std::size_t{passes} * signalCount * steps, missing)
+    {
+    }
+
+    unsigned passes() const
+    {
+        return itsPasses;
+    }
+
+    unsigned steps() const
+    {
+        return itsSteps;
+    }
+
+    std::size_t index(const Place& place) const
+    {
+        return (std::size_t{place.pass} * signalCount + place.signal) * itsSteps + place.step;
+    }
+
+    std::int16_t at(const Place& place) const
+    {
+        return itsValues[index(place)];
+    }
+
+    /// Whether there is a value, and it is known.
+    bool has(const Place& place) const
+    {
+        return at(place) >= smallest;
+    }
+
+    bool isUnknown(const Place& place) const
+    {
+        return at(place) == unknown;
+    }
+
+    void set(const Place& place, std::int16_t value)
+    {
+        itsValues[index(place)] = value;
+    }
+
+    /// Has the values of the signal's twin stand for its own: they are inputs, and are not compared a second time.
+    void copyFromTwin(unsigned signal)
+    {
+        for (unsigned pass = 0; pass < itsPasses; ++pass) {
+            for (unsigned step = 0; step < itsSteps; ++step) {
+                set({pass, signal, step}, at({pass, twinOf(signal), step}));
+            }
+        }
+        itsCopies[signal] = true;
+    }
+
+    bool isCopy(unsigned signal) const
+    {
+        return itsCopies[signal];
+    }
+
+private:
+    unsigned itsPasses;
+    unsigned itsSteps;
+    std::vector<std::int16_t> itsValues;
+    std::array<bool, signalCount> itsCopies = {};
+};
+
+}  // namespace morvik::comparison
+
+#endif

@@ -1,0 +1,66 @@
+// Where: what the places of faults have in common.
+#ifndef MORVIK_HARDWARE_COMPARISON_WHERE_H
+#define MORVIK_HARDWARE_COMPARISON_WHERE_H
+
+#include <bitset>
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Comparison.h"
+#include "Model.h"
+
+namespace morvik::comparison {
+
+/// A kind of place in a block.
+struct PlaceKind {
+    const char* text;
+    bool (*matches)(const Windows&, const Place&);
+};
+
+/// Places of one stage.
+class Where {
+public:
+    /// The narrowest that all these faults of a stage are in. The model outlives it.
+    Where(const Model& model, const Comparison& comparison, const std::vector<Fault>& faults);
+
+    /// "in segment 1 alone"; empty when the faults are spread.
+    std::string text() const;
+
+    bool contains(const Place& place) const;
+
+    /// Where a mistake in handing on border columns would show: in all states and steps alike. Of a single fault,
+    /// nothing tells where others might be.
+    Where ofBorders() const;
+
+    /// Where a mistake in an operation would show: at window edges and elsewhere alike.
+    Where ofOperation() const;
+
+    /// The same in all passes and segments.
+    Where spread() const;
+
+private:
+    unsigned stepsAround() const;
+    std::string passText() const;
+    std::string signalText() const;
+    std::string stepText() const;
+
+    const Model* itsModel;
+    Stage itsStage;
+    bool itsIsOfOnePass;
+    const PlaceKind* itsKind = nullptr;
+    std::optional<unsigned> itsPass;
+    std::optional<unsigned> itsCode;
+    std::bitset<signalCount> itsSignals;
+    std::optional<unsigned> itsSegment;
+    std::optional<unsigned> itsUnit;
+    unsigned itsFirst = 0;  ///< step
+    unsigned itsLast = 0;
+    bool itsHasRange = false;  ///< whether the steps from first to last alone belong to it
+    bool itsIsOnePlace = false;
+};
+
+}  // namespace morvik::comparison
+
+#endif

@@ -1,0 +1,63 @@
+// Passes: every value that the core computes on a block, one half-iteration at a time.
+#ifndef MORVIK_HARDWARE_TESTBENCH_PASSES_H
+#define MORVIK_HARDWARE_TESTBENCH_PASSES_H
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <ostream>
+
+#include "Decoder.h"
+#include "Division.h"
+
+class TDecoder3GPU;
+
+namespace morvik {
+
+/// The signals of a trellis step, in the order in which a pass computes them.
+constexpr std::array<const char*, 23> passSignals = {"intrinsic", "g0",     "g1",     "g2",     "g3",       "alpha0",
+                                                     "alpha1",    "alpha2", "alpha3", "alpha4", "alpha5",   "alpha6",
+                                                     "alpha7",    "beta0",  "beta1",  "beta2",  "beta3",    "beta4",
+                                                     "beta5",     "beta6",  "beta7",  "llr",    "extrinsic"};
+
+/// Bits of each, in two's complement, in eighths: -2048 stands for -256, 2047 for 255.875.
+constexpr unsigned passBits = 12;
+
+/// A constituent code by the encoder that it is of: half-iteration 0 decodes the second, the interleaved one (rule 15).
+constexpr unsigned constituentCode(unsigned halfIteration)
+{
+    return halfIteration % 2 == 0 ? 2 : 1;
+}
+
+/// Runs half-iterations on a block, on a decoder that has decoded nothing before.
+class Passes {
+public:
+    /// Throws Refusal when the library refuses generics or block. `warnings` outlives the passes.
+    Passes(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, std::ostream& warnings);
+
+    const Division& division() const;
+
+    /// The component that computes, with the streams of both constituent codes.
+    const TDecoder3GPU& component() const;
+
+    /// Computes the next half-iteration, at first 0.
+    void next();
+
+    /// A value of the half-iteration in eighths, -2048 to 2047; bits below them are dropped (rule 22). `step` is from 0
+    /// to K + 2.
+    std::int16_t value(unsigned signal, std::uint32_t step) const;
+
+    /// Whether the core computes the signal at the step: in the tail, only intrinsic values, and the forward metrics
+    /// that step K - 1 leads to. Others are 0, or mean nothing.
+    bool isComputed(unsigned signal, std::uint32_t step) const;
+
+private:
+    Decoder itsDecoder;
+    TDecoder3GPU& itsComponent;
+    std::optional<Division> itsDivision;
+    unsigned itsNext = 0;
+};
+
+}  // namespace morvik
+
+#endif

@@ -1,0 +1,45 @@
+// TraceWriter: writes the values of passes, one pass after the other.
+#ifndef MORVIK_HARDWARE_TRACE_TRACEWRITER_H
+#define MORVIK_HARDWARE_TRACE_TRACEWRITER_H
+
+#include <cstdint>
+#include <memory>
+
+#include "Selection.h"
+#include "hardware/testbench/Passes.h"
+#include "hardware/vectors/Formats.h"
+
+namespace morvik::trace {
+
+/// What goes wrong is thrown as a simulation::Error that opens with the file. No writer keeps more than a pass.
+class TraceWriter {
+public:
+    virtual ~TraceWriter() = default;
+
+    /// `passes` has just computed the half-iteration.
+    virtual void add(const Passes& passes, std::uint32_t halfIteration) = 0;
+
+    /// Writes the end. Nothing may be added behind it.
+    virtual void finish() = 0;
+};
+
+/// The table that table formats write: half-iteration, place and signals of a trellis step.
+vectors::Table traceTable(const Selection& selection);
+
+/// Rows of traceTable, all of them of the block.
+std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<vectors::TableWriter> table,
+                                        std::uint32_t block,
+                                        const Selection& selection);
+
+/// Waveforms as a value change dump (IEEE 1364-2001, clause 18).
+std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const Division& division, const Selection& selection);
+
+/// Writes the library's own trace of the selected half-iterations, with the input streams before them.
+void writeText(const SoftBlock& block,
+               const veltra_ip_morvik_v1_0_generics& generics,
+               const Selection& selection,
+               base::OutputFile file);
+
+}  // namespace morvik::trace
+
+#endif

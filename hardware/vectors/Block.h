@@ -1,0 +1,37 @@
+// Block: what goes into the core for one block, and what comes out of it.
+#ifndef MORVIK_HARDWARE_VECTORS_BLOCK_H
+#define MORVIK_HARDWARE_VECTORS_BLOCK_H
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "hardware/testbench/Passes.h"
+
+namespace morvik::vectors {
+
+struct Stimulus {
+    std::string name;  ///< what the block is for
+    std::uint32_t K = 0;
+    std::uint32_t tag = 0;
+    std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic and both parities, K + 4 values each
+};
+
+/// What the core computes at a trellis step of a half-iteration.
+struct InternalStep {
+    std::uint32_t halfIteration = 0;
+    std::uint32_t step = 0;                                 ///< from 0 to K + 2
+    std::array<std::int16_t, passSignals.size()> values{};  ///< in eighths; 0 where the core computes nothing
+};
+
+struct Expected {
+    std::uint32_t tag = 0;               ///< as the core carries it
+    std::vector<std::uint8_t> bits;      ///< K decisions of 0 or 1
+    std::vector<std::int16_t> ratios;    ///< in eighths, -2048 to 2047; empty when not asked for
+    std::vector<InternalStep> internal;  ///< K + 3 trellis steps of each half-iteration; empty when not asked for
+};
+
+}  // namespace morvik::vectors
+
+#endif

@@ -1,0 +1,100 @@
+// BlockFiles: the blocks of a set as tables, in one format.
+//
+//   blocks      a row for each block: K, iterations, tags, and where its rows begin in the other tables
+//   stimulus    K + 4 rows for each block: the three soft values of a position
+//   expected    K rows for each block: the decisions
+//   ratios      K rows for each block: log-likelihood ratios in eighths
+//   internal    K + 3 rows for each half-iteration of each block: values of the pass in eighths
+#ifndef MORVIK_HARDWARE_VECTORS_BLOCKFILES_H
+#define MORVIK_HARDWARE_VECTORS_BLOCKFILES_H
+
+#include <cstdint>
+#include <memory>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "Block.h"
+#include "Formats.h"
+#include "Settings.h"
+
+namespace morvik::vectors {
+
+/// A table as it is kept in a format, and how many rows it has.
+struct KeptTable {
+    Table table;
+    std::uint64_t rows = 0;
+};
+
+/// The tables of a set and where they are among all of them.
+struct Layout {
+    Layout(const Format& format, const Settings& settings);
+
+    std::vector<Table> tables;
+    bool streamsAreSeparate;  ///< the stimulus is three tables, one for each stream
+    std::size_t blocks = 0;
+    std::size_t stimulus = 1;  ///< the first of them
+    std::size_t expected = 0;
+    std::size_t ratios = 0;    ///< 0 when there are none
+    std::size_t internal = 0;  ///< 0 when there are none
+};
+
+/// The files of all tables that a set can have.
+std::set<std::string> filesOfAllTables();
+
+/// Writes blocks one after the other.
+class BlockWriter {
+public:
+    BlockWriter(const std::string& folder, const Format& format, const Settings& settings);
+
+    void add(const Stimulus& stimulus, const Expected& expected);
+    void finish();
+
+    /// What has been written.
+    std::vector<KeptTable> tables() const;
+
+private:
+    void addRow(std::size_t table, const Row& row);
+    void addStimulus(const Stimulus& stimulus);
+
+    Layout itsLayout;
+    std::uint32_t itsIterations;
+    std::vector<std::unique_ptr<TableWriter>> itsWriters;
+    std::vector<std::uint64_t> itsRows;
+    std::uint32_t itsBlock = 0;
+};
+
+/// Reads them again. What is wrong is thrown as a simulation::Error that opens with the place.
+class BlockReader {
+public:
+    BlockReader(const std::string& folder, const Format& format, const Settings& settings);
+
+    /// Goes to the next block; false at the end, where no table may have rows left. Names are not in the tables.
+    bool next(Stimulus& stimulus, Expected& expected);
+
+    /// The rows that have been read of each table.
+    const std::vector<std::uint64_t>& rows() const
+    {
+        return itsRows;
+    }
+
+private:
+    bool nextRow(std::size_t table);
+    void readRow(std::size_t table);
+    void expectFirst(std::size_t column, std::size_t table) const;
+    void readStimulus(Stimulus& stimulus);
+    void readExpected(Expected& expected, std::uint32_t K);
+    void readInternal(Expected& expected, std::uint32_t K);
+    void expectEnd();
+
+    Layout itsLayout;
+    std::uint32_t itsIterations;
+    std::vector<std::unique_ptr<TableReader>> itsReaders;
+    std::vector<std::uint64_t> itsRows;
+    std::int64_t itsBlock = -1;
+    Row itsRow;
+};
+
+}  // namespace morvik::vectors
+
+#endif

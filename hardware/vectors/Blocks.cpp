@@ -1,0 +1,218 @@
+// Blocks: the stimuli of a set, random and directed.
+#include "Blocks.h"
+
+#include <algorithm>
+#include <string>
+#include <utility>
+
+#include "hardware/testbench/SoftBlock.h"
+#include "link/DefaultScale.h"
+#include "link/FrameSource.h"
+#include "rules/BlockSizes.h"
+#include "src/Segmentation.h"
+
+namespace morvik::vectors {
+
+namespace {
+
+constexpr std::int8_t lowest = -128;
+constexpr std::int8_t highest = 127;
+constexpr unsigned threadsOfUnit = 4;
+constexpr std::size_t mostRows = 3;
+
+/// The frames of random bits are numbered on from size to size; those of directed blocks have numbers of their own.
+constexpr std::uint64_t firstDirectedFrame = std::uint64_t{1} << 32;
+
+/// A soft value by its stream, 0 to 2, its position, and whether that belongs to the tail.
+using Pattern = std::int8_t (*)(unsigned stream, unsigned position, bool isTail);
+
+struct NamedPattern {
+    const char* name;
+    Pattern pattern;
+};
+
+std::int8_t extreme(bool isHighest)
+{
+    return isHighest ? highest : lowest;
+}
+
+/// -1, 0 and 1, so small that metrics are often equal. The low bits of the product look random.
+std::int8_t tie(unsigned stream, unsigned position, bool)
+{
+    const std::uint32_t mixed = (3 * position + stream + 1) * 2654435761U;  // 2^32 over the golden ratio
+    return static_cast<std::int8_t>(static_cast<int>((mixed >> 16) % 3) - 1);
+}
+
+constexpr NamedPattern patterns[] = {
+    {"zeros",
+     [](unsigned, unsigned, bool) {
+         return std::int8_t{0};
+     }},
+    {"highest",
+     [](unsigned, unsigned, bool) {
+         return highest;
+     }},
+    {"lowest",
+     [](unsigned, unsigned, bool) {
+         return lowest;
+     }},
+    {"ties", tie},
+    {"alternating_positions",
+     [](unsigned, unsigned position, bool) {
+         return extreme(position % 2 == 0);
+     }},
+    {"alternating_streams",
+     [](unsigned stream, unsigned position, bool) {
+         return extreme((stream + position) % 2 == 0);
+     }},
+    {"opposed_parities",
+     [](unsigned stream, unsigned, bool) {
+         return extreme(stream != 1);
+     }},
+    {"opposed_tail",
+     [](unsigned, unsigned, bool isTail) {
+         return extreme(isTail);
+     }},
+};
+
+/// Puts stimuli together and hands them on, with the tags 0, 1, 2 ... as the width carries them.
+class Source {
+public:
+    Source(const Settings& settings, const std::function<void(const Stimulus&)>& take)
+        : itsSettings(settings), itsTake(take)
+    {
+    }
+
+    void takeRandom(const std::string& name, unsigned K, std::uint64_t frame)
+    {
+        takeFrame(name, K, frame, nextTag());
+    }
+
+    void takeFrame(const std::string& name, unsigned K, std::uint64_t frame, std::uint32_t tag)
+    {
+        Stimulus stimulus{name, K, tag, received(K, frame).streams};
+        itsTake(stimulus);
+    }
+
+    /// A code word that is sent as well as it can be.
+    void takeSaturated(unsigned K, std::uint64_t frame)
+    {
+        Stimulus stimulus{"saturated_code_word", K, nextTag(), received(K, frame, noNoise).streams};
+        for (std::vector<std::int8_t>& stream : stimulus.streams) {
+            for (std::int8_t& value : stream) {
+                value = extreme(value > 0);
+            }
+        }
+        itsTake(stimulus);
+    }
+
+    void takePattern(const NamedPattern& named, unsigned K)
+    {
+        Stimulus stimulus{named.name, K, nextTag(), {}};
+        for (unsigned stream = 0; stream < stimulus.streams.size(); ++stream) {
+            for (unsigned position = 0; position < K + tailPositions; ++position) {
+                stimulus.streams[stream].push_back(named.pattern(stream, position, position >= K));
+            }
+        }
+        itsTake(stimulus);
+    }
+
+private:
+    static constexpr int noNoise = 100000;  // 100 dB
+
+    link::Frames received(unsigned K, std::uint64_t frame, int milliDecibels) const
+    {
+        const double scale = link::defaultScale(itsSettings.generics.C_ALGORITHM_TYPE, K, itsSettings.milliDecibels);
+        link::Frames frames;
+        link::FrameSource(K, milliDecibels, scale, itsSettings.seed).make(frame, 1, frames);
+        return frames;
+    }
+
+    link::Frames received(unsigned K, std::uint64_t frame) const
+    {
+        return received(K, frame, itsSettings.milliDecibels);
+    }
+
+    std::uint32_t nextTag()
+    {
+        return itsTag++ & ((std::uint32_t{1} << itsSettings.generics.C_TAG_WIDTH % 32) - 1);
+    }
+
+    const Settings& itsSettings;
+    const std::function<void(const Stimulus&)>& itsTake;
+    std::uint32_t itsTag = 0;
+};
+
+/// How the core cuts a block of K bits: its segments, and the windows of each, which make as many rows.
+std::pair<std::uint32_t, std::size_t> cutOf(unsigned K, unsigned units)
+{
+    const std::uint32_t segments = segmentation::segmentCount(K, std::uint64_t{units} * threadsOfUnit);
+    return {segments, segmentation::windowStarts(K / segments).size() - 1};
+}
+
+void takeDirected(const Settings& settings, Source& source)
+{
+    std::uint64_t frame = firstDirectedFrame;
+    for (const unsigned K : settings.blockSizes) {
+        for (const NamedPattern& named : patterns) {
+            source.takePattern(named, K);
+        }
+        source.takeSaturated(K, frame++);
+    }
+    const auto units = static_cast<unsigned>(settings.generics.C_NUM_PU);
+    for (const unsigned K : edgeSizes(units)) {
+        const auto [segments, rows] = cutOf(K, units);
+        source.takeRandom(
+            "size_of_" + std::to_string(segments) + "_segments_" + std::to_string(rows) + "_rows", K, frame++);
+    }
+    for (const std::uint32_t tag : edgeTags(static_cast<unsigned>(settings.generics.C_TAG_WIDTH))) {
+        source.takeFrame("tag_" + std::to_string(tag), standard::blockSizes.front().K, frame++, tag);
+    }
+}
+
+}  // namespace
+
+void forEachStimulus(const Settings& settings, const std::function<void(const Stimulus&)>& take)
+{
+    Source source(settings, take);
+    for (const unsigned K : settings.blockSizes) {
+        for (unsigned frame = 0; frame < settings.blocks; ++frame) {
+            source.takeRandom(randomName, K, frame);
+        }
+    }
+    if (settings.directed) {
+        takeDirected(settings, source);
+    }
+}
+
+std::vector<unsigned> edgeSizes(unsigned units)
+{
+    std::vector<unsigned> sizes = {standard::blockSizes.front().K};
+    for (std::size_t i = 1; i < standard::blockSizes.size(); ++i) {
+        const unsigned before = standard::blockSizes[i - 1].K;
+        const unsigned K = standard::blockSizes[i].K;
+        const auto cutBefore = cutOf(before, units);
+        const auto cut = cutOf(K, units);
+        if (cut != cutBefore && std::min(cut.second, cutBefore.second) <= mostRows) {
+            sizes.push_back(before);
+            sizes.push_back(K);
+        }
+    }
+    sizes.push_back(standard::blockSizes.back().K);
+    sizes.erase(std::unique(sizes.begin(), sizes.end()), sizes.end());
+    return sizes;
+}
+
+std::vector<std::uint32_t> edgeTags(unsigned width)
+{
+    const std::uint64_t above = std::uint64_t{1} << width;
+    const auto tag = [](std::uint64_t value) {
+        return static_cast<std::uint32_t>(value);
+    };
+    std::vector<std::uint32_t> tags = {0, 1, tag(above - 1), tag(above), tag(above + 1), 0xFFFFFFFF};
+    std::sort(tags.begin(), tags.end());
+    tags.erase(std::unique(tags.begin(), tags.end()), tags.end());
+    return tags;
+}
+
+}  // namespace morvik::vectors

@@ -1,0 +1,27 @@
+// Core: the model as the source of what is expected.
+#ifndef MORVIK_HARDWARE_VECTORS_CORE_H
+#define MORVIK_HARDWARE_VECTORS_CORE_H
+
+#include <sstream>
+
+#include "Block.h"
+#include "Settings.h"
+#include "hardware/testbench/Decoder.h"
+
+namespace morvik::vectors {
+
+class Core {
+public:
+    explicit Core(const Settings& settings);
+
+    Expected expect(const Stimulus& stimulus);
+
+private:
+    Settings itsSettings;
+    std::ostringstream itsMessages;
+    Decoder itsDecoder;
+};
+
+}  // namespace morvik::vectors
+
+#endif

@@ -1,0 +1,42 @@
+// Formats: how each of them writes and reads a table.
+#ifndef MORVIK_HARDWARE_VECTORS_FORMATS_H
+#define MORVIK_HARDWARE_VECTORS_FORMATS_H
+
+#include "Table.h"
+#include "base/OutputFile.h"
+
+namespace morvik::vectors {
+
+/// Words for $readmemh.
+extern const Format memhFormat;
+
+/// Comma-separated values, with the number of the block before each row.
+extern const Format csvFormat;
+
+/// An array of NumPy.
+extern const Format npyFormat;
+
+/// An array in C, with a header.
+extern const Format cFormat;
+
+/// Write a table to a file of any name. What csvWriter gets need not be a file that seeks.
+std::unique_ptr<TableWriter> csvWriter(base::OutputFile file, const Table& table);
+std::unique_ptr<TableWriter> npyWriter(base::OutputFile file, const Table& table);
+
+/// The bits of the machine's integer that holds any value of the table, and whether it has a sign.
+struct Storage {
+    unsigned bits = 8;  ///< 8, 16 or 32
+    bool isSigned = false;
+};
+
+Storage storageOf(const Table& table);
+
+/// Throws a simulation::Error about the place unless the column holds such values.
+void checkFits(std::int64_t value, const Column& column, const std::string& place);
+
+/// So for each value of the row that the reader has come to.
+void checkFits(const Row& row, const Table& table, const TableReader& reader);
+
+}  // namespace morvik::vectors
+
+#endif

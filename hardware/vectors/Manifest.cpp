@@ -1,0 +1,231 @@
+// Manifest: manifest.json, which tells all about a set of vectors.
+#include "Manifest.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "base/Json.h"
+#include "base/Shown.h"
+#include "rules/BlockSizes.h"
+#include "simulation/Error.h"
+#include "simulation/Point.h"
+#include "simulation/TextFile.h"
+#include "simulation/Thousandths.h"
+
+namespace morvik::vectors {
+
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+Json parametersOf(const Settings& settings)
+{
+    Json json;
+    json["num_pu"] = settings.generics.C_NUM_PU;
+    json["algorithm"] = simulation::algorithmName(static_cast<unsigned>(settings.generics.C_ALGORITHM_TYPE));
+    json["tag_width"] = settings.generics.C_TAG_WIDTH;
+    json["iterations"] = settings.iterations;
+    json["block_sizes"] = settings.blockSizes;
+    json["blocks"] = settings.blocks;
+    json["ebn0_db"] = simulation::fromThousandths(settings.milliDecibels);
+    json["seed"] = settings.seed;
+    json["directed"] = settings.directed;
+    json["width"] = settings.width;
+    json["separate_streams"] = settings.separateStreams;
+    json["soft"] = settings.ratios;
+    json["internal"] = settings.internal;
+    return json;
+}
+
+Json tableOf(const KeptTable& kept)
+{
+    Json columns = Json::array();
+    for (const Column& column : kept.table.columns) {
+        columns.push_back({{"name", column.name}, {"bits", column.bits}, {"signed", column.isSigned}});
+    }
+    return {{"name", kept.table.name}, {"rows", kept.rows}, {"columns", columns}};
+}
+
+Json formatOf(const ManifestFormat& format)
+{
+    Json tables = Json::array();
+    for (const KeptTable& kept : format.tables) {
+        tables.push_back(tableOf(kept));
+    }
+    Json files = Json::array();
+    for (const ManifestFile& file : format.files) {
+        files.push_back({{"name", file.name}, {"sha256", file.sha256}});
+    }
+    return {{"name", format.name}, {"files", files}, {"tables", tables}};
+}
+
+/// The value of a member that is no larger than 32 bits hold.
+std::uint32_t word(const base::JsonMembers& members, const char* name)
+{
+    return static_cast<std::uint32_t>(members.integer(name, 0, UINT32_MAX));
+}
+
+std::vector<unsigned> blockSizesFrom(const base::JsonMembers& json)
+{
+    std::vector<unsigned> sizes;
+    for (const base::Json& size : json.list("block_sizes")) {
+        if (!size.is_number_unsigned() || size.get<std::uint64_t>() > UINT32_MAX ||
+            standard::findBlockSize(size.get<std::uint32_t>()) == nullptr) {
+            json.refuse("block_sizes", "allowed are lists of block sizes of 3GPP TS 36.212");
+        }
+        sizes.push_back(size.get<unsigned>());
+    }
+    return sizes;
+}
+
+int milliDecibelsFrom(const base::JsonMembers& json)
+{
+    constexpr double most = 50;
+    const double decibels = json.number("ebn0_db");
+    const bool isInRange = decibels >= -most && decibels <= most;
+    const int thousandths = isInRange ? static_cast<int>(std::lround(1000 * decibels)) : 0;
+    if (!isInRange || simulation::fromThousandths(thousandths) != decibels) {
+        json.refuse("ebn0_db", "allowed are -50 to 50 dB, with at most three decimals");
+    }
+    return thousandths;
+}
+
+/// The settings of the set. Whatever the core refuses is left to it.
+Settings settingsOf(const base::JsonMembers& json)
+{
+    Settings settings;
+    settings.generics.C_NUM_PU = static_cast<std::int32_t>(json.integer("num_pu", 2, 8));
+    const auto algorithm = simulation::algorithmOf(json.text("algorithm"));
+    if (!algorithm) {
+        json.refuse("algorithm", "allowed are max-log, scaled, table");
+    }
+    settings.generics.C_ALGORITHM_TYPE = static_cast<std::int32_t>(*algorithm);
+    settings.generics.C_TAG_WIDTH = static_cast<std::int32_t>(json.integer("tag_width", 0, 32));
+    settings.iterations = static_cast<unsigned>(json.integer("iterations", 1, 15));
+    settings.width = static_cast<unsigned>(json.integer("width", 8, 16));
+    if (settings.width % 8 != 0) {
+        json.refuse("width", "allowed are 8 and 16");
+    }
+    settings.blockSizes = blockSizesFrom(json);
+    settings.blocks = word(json, "blocks");
+    settings.milliDecibels = milliDecibelsFrom(json);
+    settings.seed = json.integer("seed", 0, UINT64_MAX);
+    settings.directed = json.flag("directed");
+    settings.separateStreams = json.flag("separate_streams");
+    settings.ratios = json.flag("soft");
+    settings.internal = json.flag("internal");
+    return settings;
+}
+
+/// The tables of a format, which have to be those that it writes, but for their rows.
+std::vector<KeptTable> tablesFrom(const base::Json& list, const std::string& place, const std::vector<Table>& tables)
+{
+    std::vector<KeptTable> found;
+    for (const Table& table : tables) {
+        const std::size_t i = found.size();
+        const bool isThere = i < list.size();
+        const std::uint64_t rows =
+            isThere ? base::JsonMembers(list[i], place + ": table").integer("rows", 0, UINT64_MAX) : 0;
+        found.push_back({table, rows});
+        if (!isThere || list[i] != base::Json(tableOf(found.back()))) {
+            throw simulation::Error(place + " lacks the table " + table.name + " as its parameters make it");
+        }
+    }
+    if (list.size() > found.size()) {
+        throw simulation::Error(place + " has more tables than its parameters make");
+    }
+    return found;
+}
+
+/// The format with its files, which have to be those that it writes with these settings.
+ManifestFormat formatFrom(const base::Json& value, const Settings& settings, const std::string& fileName)
+{
+    const base::JsonMembers json(value, fileName + ": format");
+    ManifestFormat found;
+    found.name = json.text("name");
+    const Format* const format = findFormat(found.name);
+    if (format == nullptr) {
+        throw simulation::Error(fileName + ": format " + base::shown(found.name) + " is not known");
+    }
+    const std::string place = fileName + ": format " + found.name;
+    for (const base::Json& each : json.list("files")) {
+        const base::JsonMembers file(each, fileName + ": file of format " + found.name);
+        found.files.push_back({file.text("name"), file.text("sha256")});
+    }
+    const std::vector<Table> tables = Layout(*format, settings).tables;
+    std::vector<std::string> names;
+    for (const Table& table : tables) {
+        const std::vector<std::string> ofTable = format->files(table);
+        names.insert(names.end(), ofTable.begin(), ofTable.end());
+    }
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        if (i == found.files.size() || found.files[i].name != names[i]) {
+            throw simulation::Error(std::string(place).append(" lacks the file ").append(names[i]));
+        }
+    }
+    if (const std::size_t next = names.size(); next < found.files.size()) {
+        throw simulation::Error(place + " has no file " + base::shown(found.files[next].name));
+    }
+    found.tables = tablesFrom(json.list("tables"), place, tables);
+    return found;
+}
+
+}  // namespace
+
+std::string manifestText(const Manifest& manifest)
+{
+    Json json;
+    json["version"] = manifest.version;
+    json["command"] = manifest.command;
+    json["parameters"] = parametersOf(manifest.settings);
+    json["blocks"] = Json::array();
+    for (const ManifestBlock& block : manifest.blocks) {
+        json["blocks"].push_back(
+            {{"name", block.name}, {"block_size", block.K}, {"tag", block.tag}, {"expected_tag", block.expectedTag}});
+    }
+    json["formats"] = Json::array();
+    for (const ManifestFormat& format : manifest.formats) {
+        json["formats"].push_back(formatOf(format));
+    }
+    constexpr int indentation = 2;
+    return json.dump(indentation, ' ', false, Json::error_handler_t::replace) + '\n';
+}
+
+Manifest parseManifest(const std::string& text, const std::string& fileName)
+{
+    const base::Json json = base::parseJson(text, fileName);
+    const base::JsonMembers members(json, fileName);
+    Manifest manifest;
+    manifest.version = members.text("version");
+    manifest.command = members.text("command");
+    manifest.settings = settingsOf({members.at("parameters"), fileName + ": parameters"});
+    for (const base::Json& each : members.list("formats")) {
+        const ManifestFormat format = formatFrom(each, manifest.settings, fileName);
+        if (std::any_of(manifest.formats.begin(), manifest.formats.end(), [&format](const ManifestFormat& other) {
+                return other.name == format.name;
+            })) {
+            throw simulation::Error(fileName + ": names the format " + format.name + " twice");
+        }
+        manifest.formats.push_back(format);
+    }
+    for (const base::Json& each : members.list("blocks")) {
+        const base::JsonMembers block(each, fileName + ": block " + std::to_string(manifest.blocks.size()));
+        manifest.blocks.push_back(
+            {block.text("name"), word(block, "block_size"), word(block, "tag"), word(block, "expected_tag")});
+    }
+    if (manifest.formats.empty()) {
+        throw simulation::Error(fileName + ": names no format");
+    }
+    if (manifest.blocks.empty()) {
+        throw simulation::Error(fileName + ": names no block");
+    }
+    return manifest;
+}
+
+Manifest readManifest(const std::string& fileName)
+{
+    simulation::expectRegularFile(fileName);
+    return parseManifest(simulation::readText(fileName), fileName);
+}
+
+}  // namespace morvik::vectors

@@ -1,0 +1,55 @@
+// Manifest: manifest.json, which tells all about a set of vectors.
+#ifndef MORVIK_HARDWARE_VECTORS_MANIFEST_H
+#define MORVIK_HARDWARE_VECTORS_MANIFEST_H
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "BlockFiles.h"
+#include "Settings.h"
+
+namespace morvik::vectors {
+
+struct ManifestBlock {
+    std::string name;
+    std::uint32_t K = 0;
+    std::uint32_t tag = 0;
+    std::uint32_t expectedTag = 0;
+};
+
+struct ManifestFile {
+    std::string name;  ///< without the folder
+    std::string sha256;
+};
+
+/// What a format keeps.
+struct ManifestFormat {
+    std::string name;
+    std::vector<KeptTable> tables;
+    std::vector<ManifestFile> files;
+};
+
+struct Manifest {
+    std::string version;  ///< of morvik
+    std::string command;  ///< which makes the set again
+    Settings settings;
+    std::vector<ManifestBlock> blocks;
+    std::vector<ManifestFormat> formats;
+};
+
+constexpr char manifestName[] = "manifest.json";
+
+std::string manifestText(const Manifest& manifest);
+
+/// Reads what a set is checked by. Throws a simulation::Error that opens with the file when the text is no such
+/// manifest, has settings that cannot be, or names no block, no format, one twice, or other tables than the settings
+/// make.
+Manifest parseManifest(const std::string& text, const std::string& fileName);
+
+/// The same of a file.
+Manifest readManifest(const std::string& fileName);
+
+}  // namespace morvik::vectors
+
+#endif

@@ -1,0 +1,32 @@
+// Settings: which blocks a set of vectors holds, for which core, and in which form.
+#ifndef MORVIK_HARDWARE_VECTORS_SETTINGS_H
+#define MORVIK_HARDWARE_VECTORS_SETTINGS_H
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+namespace morvik::vectors {
+
+struct Settings {
+    veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
+    std::uint32_t iterations = 8;
+
+    std::vector<unsigned> blockSizes;  ///< of the random blocks and of the patterns
+    unsigned blocks = 8;               ///< random ones of each size
+    int milliDecibels = 1000;          ///< Eb/N0 of the random blocks, in thousandths of a decibel
+    std::uint64_t seed = 1;
+    bool directed = true;  ///< whether there are directed blocks behind the random ones
+
+    std::vector<std::string> formats;
+    unsigned width = 8;            ///< bits of a soft value in the files: 8 or 16
+    bool separateStreams = false;  ///< whether memh has a file for each stream
+    bool ratios = false;
+    bool internal = false;  ///< every value of each pass
+};
+
+}  // namespace morvik::vectors
+
+#endif

@@ -1,0 +1,165 @@
+// The command morvik vectors: its options, what it prints, and its exit status.
+#include <nlohmann/json.hpp>
+#include <sstream>
+#include <string>
+
+#include "support/CommandTest.h"
+
+namespace {
+
+using namespace morvik::support;
+
+class CommandVectors : public CommandTest {
+protected:
+    CommandResult vectors(const std::vector<std::string>& arguments) const
+    {
+        std::vector<std::string> all = {"vectors"};
+        all.insert(all.end(), arguments.begin(), arguments.end());
+        return morvik.run(all);
+    }
+
+    void expectRefused(const std::vector<std::string>& arguments, const std::string& message) const
+    {
+        const CommandResult result = vectors(arguments);
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(result.err, "morvik vectors: " + message + '\n');
+    }
+};
+
+TEST_F(CommandVectors, MakesASetAndChecksIt)
+{
+    const CommandResult made = vectors({"--out", "set", "--block-size", "48,40", "--blocks", "2", "--no-directed"});
+    EXPECT_EQ(made.status, 0) << made.err;
+    const std::string core = "core: 2 units, scaled, 8 iterations\n";
+    EXPECT_EQ(made.out, core + "set: 4 blocks in memh\n");
+    const CommandResult checked = vectors({"--check", "set"});
+    EXPECT_EQ(checked.status, 0) << checked.err;
+    EXPECT_EQ(checked.out,
+              core +
+                  "set: 4 blocks in memh, all as the model decodes them: 4 tags, 176 decisions, 0 ratios, 0 internal "
+                  "values\n");
+    const CommandResult one = vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed"});
+    EXPECT_EQ(one.out, core + "set: 1 block in memh\n");
+}
+
+TEST_F(CommandVectors, WritesWhatDecodeReads)
+{
+    vectors({"--out", "set", "--block-size", "40", "--format", "csv", "--num-pu", "8", "--algorithm", "table"});
+    const CommandResult decoded = morvik.run({"decode", "set/stimulus.csv", "--num-pu", "8", "--algorithm", "table"});
+    EXPECT_EQ(decoded.status, 0) << decoded.err;
+    std::string expected;
+    const std::string rows = morvik.read("set/expected.csv");
+    std::string block = "0";
+    for (std::size_t line = rows.find('\n') + 1; line < rows.size(); line = rows.find('\n', line) + 1) {
+        const std::size_t comma = rows.find(',', line);
+        if (rows.substr(line, comma - line) != block) {
+            block = rows.substr(line, comma - line);
+            expected += '\n';
+        }
+        expected += rows[comma + 1];
+    }
+    EXPECT_EQ(decoded.out, expected + '\n');
+}
+
+/// The half-iteration, step and signals of a row of `morvik trace`, behind the number of the block.
+std::string withoutPlace(const std::string& row)
+{
+    std::istringstream fields(row);
+    std::string kept;
+    std::string field;
+    for (unsigned i = 0; std::getline(fields, field, ','); ++i) {
+        const bool isPlace = i == 2 || (i >= 4 && i < 8);  // code; segment, window, unit and thread
+        kept += isPlace ? "" : ',' + field;
+    }
+    return kept.substr(1);
+}
+
+TEST_F(CommandVectors, ExpectsInsideWhatTraceShows)
+{
+    vectors({"--out", "set", "--block-size", "512", "--blocks", "1", "--no-directed", "--format", "csv", "--internal"});
+    const CommandResult traced = morvik.run({"trace", "set/stimulus.csv", "--format", "csv"});
+    ASSERT_EQ(traced.status, 0) << traced.err;
+    std::istringstream internal(morvik.read("set/internal.csv"));
+    std::istringstream trace(traced.out);
+    unsigned rows = 0;
+    std::string step;
+    for (std::string row; std::getline(internal, row); ++rows) {
+        ASSERT_TRUE(std::getline(trace, step)) << rows;
+        ASSERT_EQ(row, withoutPlace(step));
+    }
+    EXPECT_EQ(rows, 1 + 16 * (512 + 3U));
+    EXPECT_FALSE(std::getline(trace, step)) << step;
+}
+
+TEST_F(CommandVectors, NamesTheCommandThatMakesTheSetAgain)
+{
+    const std::vector<std::string> arguments = {
+        "--block-size",  "40",       "--num-pu", "4",       "--algorithm", "max-log",   "--iterations", "3",
+        "--tag-width",   "4",        "--blocks", "1",       "--ebn0",      "-0.5",      "--seed",       "9",
+        "--no-directed", "--format", "csv,memh", "--width", "16",          "--streams", "separate",     "--soft",
+        "--internal"};
+    std::vector<std::string> first = {"--out", "first"};
+    first.insert(first.end(), arguments.begin(), arguments.end());
+    ASSERT_EQ(vectors(first).status, 0);
+    std::string expected = "morvik vectors";
+    for (const std::string& argument : arguments) {
+        expected += ' ' + argument;
+    }
+    EXPECT_EQ(nlohmann::json::parse(morvik.read("first/manifest.json"))["command"], expected);
+}
+
+TEST_F(CommandVectors, TellsADifference)
+{
+    const CommandResult made =
+        vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed", "--format", "csv", "--soft"});
+    EXPECT_EQ(made.out, "core: 2 units, scaled, 8 iterations\nset: 1 block in csv\n");
+    // Another algorithm gives other ratios.
+    auto manifest = nlohmann::json::parse(morvik.read("set/manifest.json"));
+    manifest["parameters"]["algorithm"] = "max-log";
+    morvik.write("set/manifest.json", manifest.dump());
+    const CommandResult checked = vectors({"--check", "set"});
+    EXPECT_EQ(checked.status, 1) << checked.err;
+    const std::string told = "core: 2 units, max-log, 8 iterations\nset: csv, block 0 (random, K = 40): ratio 0 is ";
+    EXPECT_EQ(checked.out.rfind(told, 0), 0U) << checked.out;
+}
+
+TEST_F(CommandVectors, RefusesWhatIsNotAllowed)
+{
+    const std::string help = "; 'morvik vectors --help' tells what is allowed";
+    const std::string required =
+        "--out and --block-size, or --check, are required; 'morvik vectors --help' tells what is allowed";
+    expectRefused({}, required);
+    expectRefused({"--out", "set"}, required);
+    expectRefused({"--block-size", "40"}, required);
+    expectRefused({"--out", "set", "--check", "set"}, "--out excludes --check" + help);
+    expectRefused({"--check", "set", "--num-pu", "8"},
+                  "--num-pu is for making a set, --check takes all from the manifest");
+    expectRefused({"--check", "set", "--soft"}, "--soft is for making a set, --check takes all from the manifest");
+    expectRefused(
+        {"--out", "set", "--block-size", "41"},
+        "--block-size: \"41\" is not allowed, the nearest block sizes of 3GPP TS 36.212 are 40 and 48" + help);
+    expectRefused({"--out", "set", "--block-size", "40", "--format", "memh,vhdl"},
+                  "--format: \"vhdl\" is not allowed, allowed are memh, csv, npy, c" + help);
+    expectRefused({"--out", "set", "--block-size", "40", "--width", "12"},
+                  "--width: \"12\" is not allowed, allowed are 8, 16" + help);
+    expectRefused({"--out", "set", "--block-size", "40", "--streams", "both"},
+                  "--streams: \"both\" is not allowed, allowed are packed, separate" + help);
+    expectRefused({"--out", "set", "--block-size", "40", "--ebn0", "1dB"},
+                  "--ebn0: \"1dB\" is not allowed, allowed are -50 to 50 dB, with at most three decimals" + help);
+    expectRefused({"--out", "set", "--block-size", "40", "--seed", "-1"},
+                  "--seed: \"-1\" is not allowed, allowed are the integers from 0 to 18446744073709551615" + help);
+    expectRefused({"--out", "set", "--block-size", "40", "--blocks", "0", "--no-directed"},
+                  "--blocks 0 and --no-directed together leave no block");
+    expectRefused({"--check", "nowhere"}, "nowhere/manifest.json: cannot be opened: No such file or directory");
+}
+
+TEST_F(CommandVectors, ReportsAFullDisk)
+{
+    const CommandResult result =
+        morvik.run({"vectors", "--out", "set", "--block-size", "40"}, "/dev/null", "/dev/full");
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.err, "morvik vectors: <stdout>: cannot be written: No space left on device\n");
+}
+
+}  // namespace
