@@ -11,16 +11,16 @@
 
 // One compilation of Probe.cpp defines each.
 namespace probe_generic {
-extern const bench::ProbeSet probeSet;
+extern const morvik::bench::ProbeSet probeSet;
 }
 namespace probe_ssse3 {
-extern const bench::ProbeSet probeSet;
+extern const morvik::bench::ProbeSet probeSet;
 }
 namespace probe_avx2 {
-extern const bench::ProbeSet probeSet;
+extern const morvik::bench::ProbeSet probeSet;
 }
 namespace probe_avx512 {
-extern const bench::ProbeSet probeSet;
+extern const morvik::bench::ProbeSet probeSet;
 }
 
 namespace morvik::bench {

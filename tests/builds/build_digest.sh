@@ -2,14 +2,14 @@
 # Compiles the digest and the whole model with one compiler, for one word size, at one level of optimisation.
 #   build_digest.sh COMPILER WORD LEVEL PROGRAM        build_digest.sh g++ -m32 -O0 build/digest
 set -euo pipefail
-compile=("$1" -std=c++17 "$2" -msse2 -mfpmath=sse "$3")
 program=$4
 tests=$(cd "$(dirname "$0")/.." && pwd)
 root=$(dirname "$tests")
+compile=("$1" -std=c++17 "$2" -msse2 -mfpmath=sse "$3" -I"$root" -I"$root/include" -I"$root/src" -I"$tests")
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
 "${compile[@]}" -DMORVIK_LANES=lanes_generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
-"${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -DMORVIK_VERSION='""' -I"$root/include" -I"$root/src" -I"$tests" "$root"/src/*.cpp \
+"${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -DMORVIK_VERSION='""' "$root"/src/*.cpp \
     "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/builds/digest.cpp" \
     "$work/kernels.o" -o "$program"

@@ -9,7 +9,7 @@ namespace {
 
 void readResults(const std::string& text, const std::string& name)
 {
-    using namespace simulation;
+    using namespace morvik::simulation;
     try {
         const Results results = parseResults(text, name);
         const std::string csv = csvText(results);
@@ -25,7 +25,7 @@ void readResults(const std::string& text, const std::string& name)
 /// Reads the text, and what it would be with the right checksum.
 void readCheckpoint(const std::string& text)
 {
-    using namespace simulation;
+    using namespace morvik::simulation;
     const std::string body = text.substr(text.find('\n') + 1);
     for (const std::string& whole : {text, checkpointOpening(body) + body}) {
         try {
