@@ -1,11 +1,11 @@
-// AliasTable: draws one of 256 values in one step, each with its exact probability (the method of Walker and Vose).
+// AliasTable: draws one of 256 values in constant time, with exact probabilities (alias method of Walker and Vose).
 #include "AliasTable.h"
 
 #include <vector>
 
 namespace morvik::link {
 
-/// Every entry has room for 2^40. A value with less weight than that leaves the rest to one with more, its alias.
+/// Every entry holds 2^40. An entry with less weight is filled up by one with more, its alias.
 AliasTable::AliasTable(const Weights& weights)
 {
     constexpr std::uint64_t room = std::uint64_t{1} << 40;
@@ -18,8 +18,8 @@ AliasTable::AliasTable(const Weights& weights)
         alias[value] = static_cast<std::uint8_t>(value);
         (left[value] < room ? poor : rich).push_back(value);
     }
-    // The sums are exact: while there is a poor entry there is a rich one, and those that stay full are their own
-    // alias, so that their threshold of 0 does no harm.
+    // The sums are exact: as long as there is an underfull entry, there is an overfull one. Full entries are their own
+    // alias, so their threshold of 0 is harmless.
     while (!poor.empty()) {
         const unsigned taker = poor.back();
         const unsigned giver = rich.back();

@@ -1,4 +1,4 @@
-// AliasTable: draws one of 256 values in one step, each with its exact probability (the method of Walker and Vose).
+// AliasTable: draws one of 256 values in constant time, with exact probabilities (alias method of Walker and Vose).
 #ifndef MORVIK_LINK_ALIASTABLE_H
 #define MORVIK_LINK_ALIASTABLE_H
 
@@ -7,8 +7,8 @@
 
 namespace morvik::link {
 
-/// Choose an entry with 8 random bits. A uniform 40-bit number below the entry's threshold gives the entry's own
-/// number, any other its alias. The number's 8 highest bits nearly always decide.
+/// Select an entry with 8 random bits. A uniform 40-bit number below the entry's threshold gives the entry's own index,
+/// any other its alias. Its 8 highest bits nearly always decide.
 struct AliasTable {
     static constexpr unsigned size = 256;
 
@@ -21,7 +21,7 @@ struct AliasTable {
     std::array<std::uint32_t, size> lowThreshold{};  ///< the others
     std::array<std::uint8_t, size> alias{};
 
-    /// The weights have to sum to 2^weightBits.
+    /// The weights must sum to 2^weightBits.
     explicit AliasTable(const Weights& weights);
 
     std::uint64_t threshold(unsigned entry) const

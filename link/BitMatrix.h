@@ -1,4 +1,4 @@
-// BitMatrix: 64 by 64 bits, between blocks packed into words and words that hold one position of 64 blocks.
+// BitMatrix: transposes 64 by 64 bits, between words of one block and words that hold one position of 64 blocks.
 #ifndef MORVIK_LINK_BITMATRIX_H
 #define MORVIK_LINK_BITMATRIX_H
 
@@ -11,8 +11,8 @@ namespace morvik::link {
 /// Bit c of word r is row r's element of column c.
 using BitMatrix = std::array<std::uint64_t, 64>;
 
-/// One of six steps: interleaves the rows of the upper and of the lower half, whose elements change places as in
-/// squares of 2 `half`. The pattern of rows is the same in each step, which suits vectors.
+/// One of six steps: interleaves the rows of the upper and the lower half, and swaps bits within squares of 2 `half`.
+/// Every step accesses the rows in the same pattern, which suits vectors.
 template <unsigned half>
 void transposeStep(const BitMatrix& from, BitMatrix& to)
 {
@@ -26,7 +26,7 @@ void transposeStep(const BitMatrix& from, BitMatrix& to)
     }
 }
 
-/// Exchanges rows and columns.
+/// Transposes.
 inline void transpose(BitMatrix& matrix)
 {
     BitMatrix other;

@@ -1,6 +1,7 @@
 // Channel: BPSK over additive white Gaussian noise, and the quantiser behind it.
 //
-// Probabilities are computed in 80 bits, which g++ and clang++ have on both word sizes, and then rounded to integers.
+// Probabilities are computed in 80-bit floating point, which g++ and clang++ have for both word sizes, and then rounded
+// to integers.
 #include "Channel.h"
 
 #include <cmath>
@@ -9,13 +10,13 @@ namespace morvik::link {
 
 namespace {
 
-/// The probability that a Gaussian number of variance 1 is greater than x.
+/// The probability that a standard Gaussian variable is greater than x.
 long double upperTail(long double x)
 {
     return std::erfc(x / std::sqrt(2.0L)) / 2;
 }
 
-/// The probability of what lies below x, times 2^48. The smaller tail is the one that is rounded.
+/// The probability of a value below x, times 2^48. The smaller tail is the one that is rounded.
 std::uint64_t weightBelow(long double x)
 {
     constexpr std::uint64_t one = std::uint64_t{1} << AliasTable::weightBits;
@@ -25,7 +26,7 @@ std::uint64_t weightBelow(long double x)
     return x < 0 ? weight(upperTail(-x)) : one - weight(upperTail(x));
 }
 
-/// The share that `part` has of `whole`, times 2^32; all of it when there is no whole.
+/// `part` / `whole`, times 2^32; 2^32 if `whole` is 0.
 std::uint64_t share(long double part, long double whole)
 {
     constexpr std::uint64_t all = std::uint64_t{1} << 32;
@@ -38,12 +39,12 @@ long double noiseDeviation(unsigned K, int milliDecibels)
 {
     const long double rate = static_cast<long double>(K) / (3.0L * K + 12);
     const long double ratio = std::pow(10.0L, milliDecibels / 10000.0L);
-    return 1 / std::sqrt(2 * rate * ratio);  // of energy 1 for each sent value
+    return 1 / std::sqrt(2 * rate * ratio);  // for energy 1 per transmitted value
 }
 
 RoundedDistribution roundedDistribution(long double deviation, long double scale)
 {
-    // Where the rounded value goes from r - 1 to r, in standard deviations from the mean.
+    // Where the rounded value changes from r - 1 to r, in standard deviations from the mean.
     const auto border = [=](int r) {
         return ((r - 0.5L) / scale - 1) / deviation;
     };

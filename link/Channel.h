@@ -1,6 +1,6 @@
 // Channel: BPSK over additive white Gaussian noise, and the quantiser behind it.
 //
-// A bit 1 is sent as +1 and a bit 0 as -1. A soft value is what is received times a scale, rounded and clipped to
+// A bit 1 is sent as +1 and a bit 0 as -1. A soft value is the received value times a scale, rounded and clipped to
 // -128 ... 127.
 #ifndef MORVIK_LINK_CHANNEL_H
 #define MORVIK_LINK_CHANNEL_H
@@ -12,17 +12,17 @@
 
 namespace morvik::link {
 
-/// The noise's standard deviation for an Eb/N0 that counts the tail's energy: the rate is K / (3 K + 12).
+/// The noise's standard deviation for an Eb/N0 that includes the tail's energy: the rate is K / (3 K + 12).
 long double noiseDeviation(unsigned K, int milliDecibels);
 
-/// How the rounded value r of a bit that was sent as 1 is distributed. That of a 0 is -r.
+/// The distribution of the rounded value r of a bit sent as 1. That of a 0 is the distribution of -r.
 struct RoundedDistribution {
-    /// Probabilities of r times 2^48, by the value's byte (r modulo 256): the end -128 has all that is below as well,
-    /// 127 all that is above. The sum is exact.
+    /// Probabilities of r times 2^48, indexed by the value's byte (r modulo 256). The end -128 includes all below it,
+    /// 127 all above. The sum is exact.
     AliasTable::Weights weights;
 
-    /// Of a uniform 32-bit number that divides the ends up: it is below `top`[0] when r is 127 rather than more, and
-    /// below `top`[1] when r is 128 or less rather than more; below `bottom` when r is -128 rather than less.
+    /// Thresholds for a uniform 32-bit number that splits the ends: below `top`[0], r is 127 rather than more; below
+    /// `top`[1], r is 128 or less rather than more; below `bottom`, r is -128 rather than less.
     std::array<std::uint64_t, 2> top;
     std::uint64_t bottom;
 };

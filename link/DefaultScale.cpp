@@ -1,4 +1,4 @@
-// DefaultScale: how many steps of a soft value amplitude 1 takes when nobody says otherwise.
+// DefaultScale: the default scale, in steps of a soft value for amplitude 1.
 #include "DefaultScale.h"
 
 #include "Channel.h"
@@ -11,8 +11,8 @@ double defaultScale(int algorithmType, unsigned K, int milliDecibels)
     if (algorithmType < 2) {
         return one;
     }
-    // A metric counts a soft value s as +s for a bit 1 and as -s for a bit 0, so the logarithms of their probabilities
-    // differ by 2 s. With noise of variance v, they differ by 2 y / v for what is received, y.
+    // A soft value s adds +s to a metric for a bit 1 and -s for a bit 0, so the logarithms of their probabilities
+    // differ by 2 s. For a received value y and noise of variance v they differ by 2 y / v.
     const long double deviation = noiseDeviation(K, milliDecibels);
     return static_cast<double>(one / (deviation * deviation));
 }

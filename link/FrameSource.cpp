@@ -14,7 +14,7 @@ namespace morvik::link {
 
 namespace {
 
-/// Numbers of soft values within a frame, from one stream to the next; more than the K + 4 of any block.
+/// Index distance of soft values from one stream of a frame to the next; more than the K + 4 of any block.
 constexpr std::uint32_t streamStride = 8192;
 
 int checkedMilliDecibels(int milliDecibels)
@@ -38,7 +38,7 @@ void unpack(const std::uint64_t* block, unsigned K, std::uint8_t* bits)
 {
     constexpr std::uint64_t everyByte = 0x0101010101010101;
     for (unsigned k = 0; k < K; k += 8) {
-        // Byte j keeps bit j of the eight; adding 127 moves it to the highest place, whichever it was.
+        // Byte j keeps bit j of the eight; adding 127 moves it to the top, whichever it was.
         const std::uint64_t eight = (block[k / 64] >> k % 64 & 0xFF) * everyByte & 0x8040201008040201;
         const std::uint64_t bytes = (eight + 0x7F * everyByte) >> 7 & everyByte;
         std::memcpy(bits + k, &bytes, sizeof bytes);
@@ -98,7 +98,7 @@ void FrameSource::drawInformation(std::uint64_t first, unsigned count)
     }
 }
 
-/// Makes frames of the encoded blocks, from place `place` on.
+/// Makes frames from the encoded blocks, starting at index `place`.
 void FrameSource::receive(std::uint64_t first, unsigned count, std::size_t place, Frames& frames)
 {
     for (unsigned i = 0; i < count; ++i) {
@@ -123,7 +123,7 @@ void FrameSource::receiveDiscrete(const FrameRandom& random, unsigned frame, std
                        &frames.streams[s][place * (itsK + 4)],
                        frames.clipped[place]);
     }
-    // As many as the caches hold well.
+    // As many as fit well into the caches.
     if (itsSampler.size() >= 256) {
         itsSampler.draw();
     }

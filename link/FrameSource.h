@@ -14,7 +14,7 @@
 
 namespace morvik::link {
 
-/// Some frames, one after the other.
+/// A number of consecutive frames.
 struct Frames {
     std::vector<std::uint8_t> sent;                   ///< K bits of each frame, each 0 or 1
     std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic, parity 1, parity 2: K + 4 soft values of each
@@ -29,15 +29,15 @@ enum class Noise {
                ///< machine; a check of the other
 };
 
-/// Makes the frames of one point. A frame is determined by seed, K, Eb/N0, scale and its number. Its information bits
-/// do not depend on the scale.
+/// Makes the frames of one point. A frame follows from seed, K, Eb/N0, scale and its number. Its information bits do
+/// not depend on the scale.
 class FrameSource {
 public:
     /// K                one of the 188 block sizes
     /// milliDecibels    Eb/N0 in thousandths of a decibel, from -262144 to 262143
     /// scale            steps of the soft values for amplitude 1, above 0
     ///
-    /// Throws std::invalid_argument for any other. `form` is there for tests.
+    /// Throws std::invalid_argument for other values. `form` is for tests.
     FrameSource(unsigned K,
                 int milliDecibels,
                 double scale,
@@ -45,7 +45,8 @@ public:
                 Noise noise = Noise::discrete,
                 const SamplerForm& form = samplerForms().front());
 
-    /// Makes frames first to first + count - 1. Any cut of a range gives the same frames; multiples of 64 cost least.
+    /// Makes frames first to first + count - 1. The frames do not depend on how a range is split; multiples of 64 cost
+    /// least.
     void make(std::uint64_t first, unsigned count, Frames& frames);
 
 private:

@@ -1,4 +1,4 @@
-// GaussianNumber: a number of the Gaussian distribution of mean 0 and variance 1 (the method of Box and Muller).
+// GaussianNumber: a standard Gaussian number (the method of Box and Muller).
 #ifndef MORVIK_LINK_GAUSSIANNUMBER_H
 #define MORVIK_LINK_GAUSSIANNUMBER_H
 
@@ -10,7 +10,7 @@ namespace morvik::link {
 
 inline double gaussianNumber(const RandomBlock& random)
 {
-    // 53 bits each: one above 0 and up to 1, for the radius, and one below 1, for the angle.
+    // 53 bits each: one in (0, 1] for the radius, one in [0, 1) for the angle.
     const auto uniform = [](std::uint32_t low, std::uint32_t high) {
         return std::ldexp(static_cast<double>((std::uint64_t{high} << 32 | low) >> 11), -53);
     };

@@ -1,4 +1,4 @@
-// Random: the random numbers of a frame, from a counter: each has its place and is drawn without the others.
+// Random: the random numbers of a frame, counter-based: each has an index and is drawn without the others.
 #include "Random.h"
 
 namespace morvik::link {

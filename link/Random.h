@@ -1,7 +1,7 @@
-// Random: the random numbers of a frame, from a counter: each has its place and is drawn without the others.
+// Random: the random numbers of a frame, counter-based: each has an index and is drawn without the others.
 //
 // The generator is Philox4x32-10 of Random123. Its key is the seed; its counter holds the frame, the point and an
-// index, for which it gives 128 bits. So a frame comes out the same whatever was drawn before, by any thread.
+// index, and gives 128 bits. So a frame does not depend on what was drawn before, or by which thread.
 #ifndef MORVIK_LINK_RANDOM_H
 #define MORVIK_LINK_RANDOM_H
 
@@ -14,10 +14,10 @@ namespace morvik::link {
 
 using RandomKey = std::array<std::uint32_t, 2>;
 
-/// 128 random bits; word 0 holds the lowest.
+/// 128 random bits; word 0 is the lowest.
 using RandomBlock = std::array<std::uint32_t, 4>;
 
-/// The random block of a counter: of its words 0 and 1, word 0 lowest, and of its words 2 and 3.
+/// The random block of a counter, given as words 0 and 1, word 0 lowest, and words 2 and 3.
 inline RandomBlock randomBlock(const RandomKey& key, std::uint64_t counterLow, std::uint64_t counterHigh)
 {
     const auto low = [](std::uint64_t words) {
@@ -58,13 +58,13 @@ private:
     std::uint64_t itsHigh;
 };
 
-/// Where the indices of a frame's numbers begin, by what they are for.
+/// First indices of a frame's random numbers, by purpose.
 namespace random_index {
 
-constexpr std::uint32_t information = 0;         ///< one for every 128 information bits
-constexpr std::uint32_t softValues = 1U << 24;   ///< one for every eight soft values
-constexpr std::uint32_t refinements = 2U << 24;  ///< one for every soft value, seldom needed
-constexpr std::uint32_t gaussian = 3U << 24;     ///< one for every Gaussian number
+constexpr std::uint32_t information = 0;         ///< one per 128 information bits
+constexpr std::uint32_t softValues = 1U << 24;   ///< one per eight soft values
+constexpr std::uint32_t refinements = 2U << 24;  ///< one per soft value, seldom needed
+constexpr std::uint32_t gaussian = 3U << 24;     ///< one per Gaussian number
 
 }  // namespace random_index
 

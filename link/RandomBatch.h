@@ -1,4 +1,4 @@
-// RandomBatch: random blocks that are drawn together.
+// RandomBatch: random blocks drawn together.
 #ifndef MORVIK_LINK_RANDOMBATCH_H
 #define MORVIK_LINK_RANDOMBATCH_H
 
@@ -11,7 +11,7 @@
 
 namespace morvik::link {
 
-/// Use: clear, put up counters, draw, then fetch.
+/// Use: clear, add counters, draw, then fetch.
 class RandomBatch {
 public:
     RandomBatch(const RandomKey& key, const SamplerForm& form) : itsKey(key), itsForm(form) {}

@@ -1,4 +1,4 @@
-// SamplerForm: the ways to draw quantised values, one for each instruction set that has its own.
+// SamplerForm: the implementations of drawing quantised values, one for each instruction set that has its own.
 #include "SamplerForm.h"
 
 #include <algorithm>
@@ -11,13 +11,13 @@ namespace morvik::link {
 
 namespace {
 
-/// Bits of a group's masks, of eight values.
+/// The mask bits of eight values of a group.
 struct Left8 {
     unsigned undecided = 0;
     unsigned ends = 0;
 };
 
-/// Draws the eight values of a random block; the definition of what the other forms do.
+/// Draws the eight values of a random block; defines what the other forms must give.
 Left8 drawBlock(const AliasTable& table, const RandomBlock& random, unsigned bits, std::int8_t* values)
 {
     Left8 left;

@@ -1,15 +1,15 @@
 // SamplerFormX86: draws quantised values with vector instructions.
 //
-// A vector holds words 0 and 1 of its random blocks, side by side, and another one words 2 and 3: what chooses the
-// entries of as many values as it has bytes, and what is compared with their thresholds.
+// One vector holds words 0 and 1 of its random blocks, side by side, which select the table entries of as many values
+// as it has bytes. Another holds words 2 and 3, which are compared with the thresholds.
 //
-// Functions are compiled for their instruction set one by one, so that none of this serves another machine.
+// Functions are compiled for their instruction set one by one, so that no other code uses it.
 #include "SamplerFormX86.h"
 
 #if defined(MORVIK_LINK_X86)
 
 #if !defined(__clang__)
-// g++ 12 takes the undefined operands in its own header of AVX-512 for mistakes.
+// g++ 12 warns about the undefined operands in its own AVX-512 header.
 #pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 #endif
 #include <immintrin.h>
@@ -31,7 +31,7 @@ constexpr unsigned rounds = 10;
 constexpr std::uint32_t multiplier0 = 0xD2511F53;
 constexpr std::uint32_t multiplier2 = 0xCD9E8D57;
 
-/// The key's two words in each round.
+/// The two key words of each round.
 struct RoundKeys {
     std::array<int, rounds> word0{};
     std::array<int, rounds> word1{};
@@ -60,8 +60,8 @@ struct Random512 {
     __m512i high;
 };
 
-/// From counters to random blocks. A round multiplies word 0 and word 2; of each product, the low half becomes the odd
-/// word of the other pair, and the high half, with that pair's odd word and a word of the key added, its even word.
+/// From counters to random blocks. A round multiplies word 0 and word 2. The low half of each product becomes the odd
+/// word of the other pair; the high half, XORed with that pair's odd word and a key word, becomes its even word.
 template <std::size_t count>
 MORVIK_AVX512 MORVIK_INLINE void philox(const RoundKeys& keys, Random512 (&random)[count])
 {
@@ -96,7 +96,7 @@ MORVIK_AVX512 MORVIK_INLINE Table512 loadTable512(const std::array<std::uint8_t,
              _mm512_loadu_si512(&bytes[192])}};
 }
 
-/// The bytes of a table that `entries` name; `upper` marks those in the table's second half.
+/// Looks up the bytes of a table at `entries`; `upper` marks those in the table's second half.
 MORVIK_AVX512 MORVIK_INLINE __m512i lookUp(const Table512& table, __m512i entries, __mmask64 upper)
 {
     return _mm512_mask_mov_epi8(_mm512_permutex2var_epi8(table.quarter[0], entries, table.quarter[1]),
@@ -197,9 +197,9 @@ MORVIK_AVX2 MORVIK_INLINE void philox(const RoundKeys& keys, Random256 (&random)
     }
 }
 
-/// Bytes of a half of a table, of which the entries' seven low bits name one: `count` sixteenths from `bytes` on. The
-/// highest bit of `choice` tells the halves of what is left apart, its next bit their halves. Entries with their
-/// highest bit set get zeros.
+/// Looks up bytes in half of a table by the entries' seven low bits, in `count` sixteenths from `bytes` on. The highest
+/// bit of `choice` selects the half of what is left, its next bit the half of that. Entries with their highest bit set
+/// get zeros.
 template <unsigned count>
 MORVIK_AVX2 MORVIK_INLINE __m256i lookUpHalf(const std::uint8_t* bytes, __m256i entries, __m256i choice)
 {
@@ -214,7 +214,7 @@ MORVIK_AVX2 MORVIK_INLINE __m256i lookUpHalf(const std::uint8_t* bytes, __m256i 
     }
 }
 
-/// The bytes of a table that `entries` name.
+/// Looks up the bytes of a table at `entries`.
 MORVIK_AVX2 MORVIK_INLINE __m256i lookUp(const std::array<std::uint8_t, 256>& table, __m256i entries)
 {
     const __m256i choice = _mm256_add_epi8(entries, entries);
@@ -222,7 +222,7 @@ MORVIK_AVX2 MORVIK_INLINE __m256i lookUp(const std::array<std::uint8_t, 256>& ta
     return _mm256_or_si256(lookUpHalf<8>(table.data(), entries, choice), lookUpHalf<8>(&table[128], others, choice));
 }
 
-/// A byte of ones for each bit that is 0.
+/// A byte of ones for each 0 bit.
 MORVIK_AVX2 MORVIK_INLINE __m256i bytesOfZeros(std::uint32_t bits)
 {
     const __m256i spread = _mm256_setr_epi8(
@@ -237,7 +237,7 @@ MORVIK_AVX2 MORVIK_INLINE std::uint64_t maskOf(__m256i bytes)
     return static_cast<std::uint32_t>(_mm256_movemask_epi8(bytes));
 }
 
-/// What is left to the caller of 32 values.
+/// The masks left to the caller, for 32 values.
 struct Left32 {
     std::uint64_t undecided;
     std::uint64_t ends;

@@ -1,7 +1,7 @@
-// SoftValueSampler: draws the soft values of sent bits straight from their distribution.
+// SoftValueSampler: draws the soft values of transmitted bits directly from their distribution.
 //
-// A form draws all of them as 16 random bits can tell. What is left takes a value's own random block: where the 8 bits
-// equal the threshold's, its word 0 goes on; at the ends of the range, its word 1 tells how far beyond.
+// A form draws every value from 16 random bits. The rest take a random block each: if the 8 bits equal the threshold's,
+// its word 0 decides; at the ends of the range, its word 1 tells how far beyond.
 #include "SoftValueSampler.h"
 
 #include <algorithm>
@@ -10,7 +10,7 @@ namespace morvik::link {
 
 namespace {
 
-/// The value of a 1 or of a 0, from that of the other or of itself, as a byte.
+/// Converts between the values of a 1 and of a 0, as bytes.
 std::uint8_t turned(int value, bool bit)
 {
     return static_cast<std::uint8_t>(bit ? value : -value);
@@ -65,7 +65,7 @@ void SoftValueSampler::draw()
     itsGroupCount = 0;
 }
 
-/// Makes the marked values the open ones, and draws their random blocks.
+/// Collects the marked values as open ones, and draws their random blocks.
 void SoftValueSampler::collect(std::uint64_t ValueGroup::*marks)
 {
     itsOpen.clear();
@@ -84,7 +84,7 @@ void SoftValueSampler::collect(std::uint64_t ValueGroup::*marks)
     itsRefinements.draw();
 }
 
-/// A value whose 8 bits equal the threshold's.
+/// Decides a value whose 8 bits equal the threshold's.
 void SoftValueSampler::decide(OpenValue open, std::uint32_t random)
 {
     ValueGroup& group = itsGroups[open / 64];
@@ -97,7 +97,7 @@ void SoftValueSampler::decide(OpenValue open, std::uint32_t random)
     group.ends = (group.ends & ~place) | (value == 127 || value == 128 ? place : 0);
 }
 
-/// A value at one of the range's ends.
+/// Decides a value at one end of the range.
 void SoftValueSampler::divideEnd(OpenValue open, std::uint32_t random)
 {
     const ValueGroup& group = itsGroups[open / 64];

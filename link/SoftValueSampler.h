@@ -1,4 +1,4 @@
-// SoftValueSampler: draws the soft values of sent bits straight from their distribution.
+// SoftValueSampler: draws the soft values of transmitted bits directly from their distribution.
 #ifndef MORVIK_LINK_SOFTVALUESAMPLER_H
 #define MORVIK_LINK_SOFTVALUESAMPLER_H
 
@@ -14,13 +14,13 @@
 
 namespace morvik::link {
 
-/// Use: put up the values that are wanted, of any frames, then draw them all at once.
+/// Use: add the wanted values, of any frames, then draw them all at once.
 class SoftValueSampler {
 public:
     SoftValueSampler(const RoundedDistribution& distribution, const RandomKey& key, const SamplerForm& form);
 
-    /// Puts up the values of `count` bits of a frame, 64 to a word. `number` is the first one's number within the
-    /// frame, a multiple of 8. Those that are clipped will be counted in `clipped`.
+    /// Adds the values of `count` bits of a frame, 64 per word. `number` is the index of the first one within the
+    /// frame, a multiple of 8. Clipped values will be counted in `clipped`.
     void put(const FrameRandom& random,
              std::uint32_t number,
              const std::uint64_t* bits,
@@ -28,17 +28,17 @@ public:
              std::int8_t* values,
              std::uint32_t& clipped);
 
-    /// How many groups of values are put up.
+    /// The number of groups added.
     std::size_t size() const
     {
         return itsGroupCount;
     }
 
-    /// Draws all values that were put up.
+    /// Draws all added values.
     void draw();
 
 private:
-    /// A value that needs its own random block: number i of group g is 64 g + i.
+    /// A value that needs its own random block: value i of group g is 64 g + i.
     using OpenValue = std::uint32_t;
 
     void collect(std::uint64_t ValueGroup::*marks);
@@ -50,7 +50,7 @@ private:
     RandomKey itsKey;
     SamplerForm itsForm;
     std::vector<ValueGroup> itsGroups;
-    std::size_t itsGroupCount = 0;  ///< of itsGroups that are put up
+    std::size_t itsGroupCount = 0;  ///< used part of itsGroups
     std::vector<OpenValue> itsOpen;
     RandomBatch itsRefinements;
 };

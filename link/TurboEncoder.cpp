@@ -14,7 +14,7 @@ namespace {
 
 constexpr unsigned tailPositions = 4;
 
-/// Position i of the second encoder's order is position [i] of the first one's.
+/// Entry i is the position, in the first encoder's order, of the second encoder's bit i.
 std::vector<std::uint16_t> permutation(unsigned K)
 {
     const standard::BlockSize* const row = standard::findBlockSize(K);
@@ -32,7 +32,7 @@ std::vector<std::uint16_t> permutation(unsigned K)
 /// A constituent encoder of 64 blocks: feedback 1 + D^2 + D^3, parity 1 + D + D^3.
 class ConstituentEncoder {
 public:
-    /// Takes a bit of each block and returns the parity bits.
+    /// Takes one bit of each block and returns the parity bits.
     std::uint64_t step(std::uint64_t bits)
     {
         const std::uint64_t fed = bits ^ itsMiddle ^ itsOldest;
@@ -43,7 +43,7 @@ public:
         return parity;
     }
 
-    /// The bits that feed zeros, so that three steps end in state 0.
+    /// The bits that cancel the feedback, so that three steps end in state 0.
     std::uint64_t terminating() const
     {
         return itsMiddle ^ itsOldest;
@@ -55,7 +55,7 @@ private:
     std::uint64_t itsOldest = 0;
 };
 
-/// The three systematic and parity bits that end a trellis, in the order they are sent.
+/// The three systematic and parity bits that terminate a trellis, in transmission order.
 std::array<std::uint64_t, 6> terminate(ConstituentEncoder& encoder)
 {
     std::array<std::uint64_t, 6> tail{};
@@ -86,7 +86,7 @@ void TurboEncoder::encode(const PackedBlocks& information, unsigned count, Strea
         streams[s].words = itsWords;
         streams[s].bits.resize(std::size_t{count} * itsWords);
     }
-    // The systematic stream is the information but for its last word, which has the tail.
+    // The systematic stream equals the information, except its last word, which has the tail.
     std::copy_n(information.bits.begin(), streams[0].bits.size(), streams[0].bits.begin());
     scatter(0, itsWords - 1, count, streams[0]);
     for (unsigned word = 0; word < itsWords; ++word) {
@@ -104,7 +104,7 @@ void TurboEncoder::encodeSlices()
         parity1[k] = first.step(systematic[k]);
         parity2[k] = second.step(systematic[itsPermutation[k]]);
     }
-    // The tail goes over the three streams position by position, the first encoder's before the second's.
+    // The tail is distributed over the three streams position by position, the first encoder's before the second's.
     unsigned position = itsK;
     for (ConstituentEncoder* const encoder : {&first, &second}) {
         const std::array<std::uint64_t, 6> tail = terminate(*encoder);
@@ -116,7 +116,7 @@ void TurboEncoder::encodeSlices()
     }
 }
 
-/// Turns a word of each block into 64 slices of the systematic stream.
+/// Converts one word of each block to 64 slices of the systematic stream.
 void TurboEncoder::gather(const PackedBlocks& information, unsigned word, unsigned count)
 {
     BitMatrix matrix{};
@@ -127,7 +127,7 @@ void TurboEncoder::gather(const PackedBlocks& information, unsigned word, unsign
     std::copy(matrix.begin(), matrix.end(), &itsSlices[0][std::size_t{64} * word]);
 }
 
-/// Turns 64 slices of a stream into a word of each block.
+/// Converts 64 slices of a stream to one word of each block.
 void TurboEncoder::scatter(unsigned stream, unsigned word, unsigned count, PackedBlocks& blocks) const
 {
     BitMatrix matrix;

@@ -9,7 +9,7 @@
 
 namespace morvik::link {
 
-/// Blocks of bits, one after the other, each in `words` words: bit i of a block is bit i % 64 of its word i / 64.
+/// Consecutive blocks of bits, each in `words` words: bit i of a block is bit i % 64 of its word i / 64.
 struct PackedBlocks {
     std::size_t words = 0;
     std::vector<std::uint64_t> bits;
@@ -27,17 +27,17 @@ struct PackedBlocks {
 
 class TurboEncoder {
 public:
-    /// How many blocks one call encodes at most. It takes about as long for one.
+    /// The most blocks that one call encodes. A single block takes about as long.
     static constexpr unsigned blocksAtOnce = 64;
 
-    /// The three streams: systematic, first and second parity. K + 4 bits of each block, its twelve tail bits last, in
+    /// The three streams: systematic, first and second parity. Each block has K + 4 bits, its twelve tail bits last, in
     /// the order of include/morvik_v1_0_bitacc_cmodel.h.
     using Streams = std::array<PackedBlocks, 3>;
 
-    /// Throws std::invalid_argument when K is no block size.
+    /// Throws std::invalid_argument if K is not a block size.
     explicit TurboEncoder(unsigned K);
 
-    /// Words of a packed block, with its tail or without.
+    /// Words of a packed block, with and without its tail.
     unsigned words() const
     {
         return itsWords;
