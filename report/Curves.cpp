@@ -1,4 +1,4 @@
-// Curves: error rates against Eb/N0 and against iterations, as they are drawn and tabulated.
+// Curves: error rates against Eb/N0 and against iterations, for plots and tables.
 #include "Curves.h"
 
 #include <algorithm>
@@ -59,7 +59,7 @@ std::vector<Curve> curvesOf(const std::vector<Row>& rows)
 
 std::vector<Curve> againstIterations(const std::vector<Curve>& curves)
 {
-    std::map<std::pair<std::size_t, double>, Curve> found;  // by the first curve of the family, and Eb/N0
+    std::map<std::pair<std::size_t, double>, Curve> found;  // keyed by the first curve of the family, and Eb/N0
     for (const Curve& curve : curves) {
         const auto first = std::find_if(curves.begin(), curves.end(), [&curve](const Curve& other) {
             return other.family == curve.family && other.reference == curve.reference;

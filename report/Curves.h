@@ -1,4 +1,4 @@
-// Curves: error rates against Eb/N0 and against iterations, as they are drawn and tabulated.
+// Curves: error rates against Eb/N0 and against iterations, for plots and tables.
 #ifndef MORVIK_REPORT_CURVES_H
 #define MORVIK_REPORT_CURVES_H
 
@@ -10,10 +10,10 @@
 
 namespace morvik::report {
 
-/// Stands for a figure that is not known.
+/// Marks an unknown figure.
 constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
 
-/// One point of a curve. Bounds are those of the 95 % confidence interval; without them no bar is drawn.
+/// One point of a curve. The bounds are the 95 % confidence interval; without them no bar is drawn.
 struct Sample {
     double ebn0 = 0;  // in dB
 
@@ -24,35 +24,35 @@ struct Sample {
     double blerLow = unknown;
     double blerHigh = unknown;
 
-    // No error was seen: all that is known of the rate is that it is below its upper bound.
+    // No error was seen: the rate is known only to be below its upper bound.
     bool berBelow = false;
     bool blerBelow = false;
 
-    // Zero blocks: how many there were, and how many errors, is not known.
+    // Zero blocks: the numbers of blocks and errors are unknown.
     std::uint64_t blocks = 0;
     std::uint64_t bitErrors = 0;
     std::uint64_t blockErrors = 0;
 
-    double clipped = unknown;  // the fraction of the soft values that were clipped
-    unsigned iterations = 0;   // after which this was counted; 0 where it is not known
-    std::size_t row = 0;       // where it is tabulated
+    double clipped = unknown;  // fraction of clipped soft values
+    unsigned iterations = 0;   // iterations before the count; 0 if unknown
+    std::size_t row = 0;       // its row in the table
 };
 
 /// A series of the plot.
 struct Curve {
     std::string title;
-    bool reference = false;  // to compare with: drawn dashed, after the others in the legend
+    bool reference = false;  // drawn dashed, after the others in the legend
     std::vector<Sample> samples;
-    std::string family = {};  // the title that it shares with the curves that differ in one number alone, which ascends
+    std::string family = {};  // common title of the curves that differ only in one number, in ascending order
 };
 
-/// What a point was simulated with. Zero and the empty text stand for what is not known.
+/// The parameters of a point. Zero or an empty string means unknown.
 struct Setting {
     unsigned blockSize = 0;
     unsigned numPu = 0;
-    std::string algorithm;  // its name
+    std::string algorithm;  // name
     unsigned iterations = 0;
-    std::string scale;  // steps for amplitude 1; empty or "auto" where it follows from the rest
+    std::string scale;  // steps for amplitude 1; empty or "auto" if it follows from the rest
 };
 
 /// A row of a result file.
@@ -61,13 +61,13 @@ struct Row {
     Sample sample;
 };
 
-/// The curves that the rows belong to, in the order of their first rows; samples are put in the order of Eb/N0. Rows of
-/// one curve have the same setting, which is its title: "K = 512, 8 units, scaled, 6 iterations".
-/// Those that differ in their iterations alone are a family.
+/// The curves of the rows, in the order of their first rows; samples are sorted by Eb/N0. The rows of one curve have
+/// the same setting, which is its title: "K = 512, 8 units, scaled, 6 iterations". Curves that differ only in their
+/// iterations form a family.
 std::vector<Curve> curvesOf(const std::vector<Row>& rows);
 
-/// The same samples against iterations: a curve for each family and Eb/N0 at which there are several of them. Those
-/// that differ in Eb/N0 alone are a family.
+/// The same samples against iterations: a curve for each family and each Eb/N0 with several of them. Curves that differ
+/// only in Eb/N0 form a family.
 std::vector<Curve> againstIterations(const std::vector<Curve>& curves);
 
 }  // namespace morvik::report

@@ -1,4 +1,4 @@
-// Drawing: a picture of rectangles, arrows and words, in the formats of the plots.
+// Drawing: a picture of rectangles, arrows and text, in the formats of the plots.
 #include "Drawing.h"
 
 #include <utility>

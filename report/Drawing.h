@@ -1,4 +1,4 @@
-// Drawing: a picture of rectangles, arrows and words, in the formats of the plots.
+// Drawing: a picture of rectangles, arrows and text, in the formats of the plots.
 #ifndef MORVIK_REPORT_DRAWING_H
 #define MORVIK_REPORT_DRAWING_H
 
@@ -7,7 +7,7 @@
 
 namespace morvik::report {
 
-/// Places are in points from the upper left corner; a picture is 1000 points wide. Colours are "#rrggbb".
+/// Coordinates are in points from the upper left corner; a picture is 1000 points wide. Colours are "#rrggbb".
 class Drawing {
 public:
     Drawing(int height, std::string title, std::string description);
@@ -15,18 +15,18 @@ public:
     void rectangle(double x, double y, double width, double height, const std::string& colour);
     void arrow(double fromX, double fromY, double toX, double toY, const std::string& colour);
 
-    /// What comes at the place: the words' beginning, middle or end.
+    /// Which part of the text is at the coordinates: its beginning, middle or end.
     enum class Anchor { left, centre, right };
 
-    /// The words stand around the height y.
+    /// The text is centred vertically on y.
     void text(double x, double y, const std::string& words, double points, Anchor anchor, const std::string& colour);
 
     const std::string& title() const;
 
-    /// What those read who do not see the picture.
+    /// Text alternative for readers who cannot see the picture.
     const std::string& description() const;
 
-    /// What gnuplot is told; the suffix is .svg, .png or .pdf.
+    /// The gnuplot script; the suffix is .svg, .png or .pdf.
     std::string script(const std::string& suffix) const;
 
 private:

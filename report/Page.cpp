@@ -1,4 +1,4 @@
-// Page: the report on a run, as one HTML file that needs no other.
+// Page: the report on a run, as one self-contained HTML file.
 #include "Page.h"
 
 #include <algorithm>
@@ -40,7 +40,7 @@ std::string intervalText(const Rate& rate)
     return rate.hasInterval() ? report::rate(rate.low) + " \u2026 " + report::rate(rate.high) : "";
 }
 
-/// A count, where there were blocks to count in.
+/// A count; without blocks there is no figure.
 std::string countText(const Sample& sample, std::uint64_t count)
 {
     return sample.blocks > 0 ? grouped(count) : noFigure;
@@ -63,7 +63,7 @@ std::string colourName(const View& view, std::size_t curve)
 
 // ---- Data for the script
 
-/// A string of JSON that may stand in a script element: nothing in it is taken as markup.
+/// A JSON string that is safe in a script element: nothing in it is taken as markup.
 std::string json(const std::string& text)
 {
     std::string result = "\"";
@@ -107,7 +107,7 @@ std::string countsJson(const Sample& sample)
     return '[' + text + ']';
 }
 
-/// What is drawn of a curve; samples are named by their rows.
+/// How a curve is drawn; samples are identified by their rows.
 std::string curveJson(const View& view, std::size_t index)
 {
     const Curve& curve = view.curves[index];
@@ -180,7 +180,7 @@ std::string style(const std::vector<View>& views)
     return text.str();
 }
 
-/// Nothing may be loaded from anywhere.
+/// Forbids loading anything from anywhere.
 std::string head(const std::string& title, const std::vector<View>& views)
 {
     return "<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n<meta charset=\"utf-8\">\n"
@@ -286,7 +286,7 @@ void writePoints(std::ostream& page, const View& view)
     page << "</table>\n</div>\n</section>\n";
 }
 
-/// A command that may be broken between its words, and not at a hyphen.
+/// A command that may wrap between its words, but not at a hyphen.
 std::string withWholeWords(const std::string& command)
 {
     std::string result = "<span>";

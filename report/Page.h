@@ -1,4 +1,4 @@
-// Page: the report on a run, as one HTML file that needs no other.
+// Page: the report on a run, as one self-contained HTML file.
 #ifndef MORVIK_REPORT_PAGE_H
 #define MORVIK_REPORT_PAGE_H
 
@@ -10,18 +10,18 @@
 
 namespace morvik::report {
 
-/// What the report says besides the curves. All texts are plain, none is taken as HTML.
+/// The report's content besides the curves. All strings are plain text; none is taken as HTML.
 struct RunDescription {
     std::string title;
     std::vector<std::pair<std::string, std::string>> parameters;  // name and value
-    std::string command;                                          // the line that repeats the run
+    std::string command;                                          // the command that repeats the run
 };
 
-/// Throws std::runtime_error, saying why, unless the file can be written.
+/// Throws std::runtime_error with the reason if the file cannot be written.
 void checkReport(const std::string& fileName);
 
-/// Writes the report: the curves to look at closely, a table of all points, the parameters and the command. The file
-/// appears complete or not at all. Throws std::runtime_error.
+/// Writes the report: the interactive curves, a table of all points, the parameters and the command. The file appears
+/// complete or not at all. Throws std::runtime_error.
 void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run);
 
 }  // namespace morvik::report

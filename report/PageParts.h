@@ -1,4 +1,4 @@
-// PageParts: page.css and page.js, as the build found them.
+// PageParts: page.css and page.js, embedded by the build.
 #ifndef MORVIK_REPORT_PAGEPARTS_H
 #define MORVIK_REPORT_PAGEPARTS_H
 

@@ -21,7 +21,7 @@ namespace {
     throw std::runtime_error(fileName + ": " + what);
 }
 
-/// Tells the format; throws where none is known.
+/// Returns the format; throws if it is unknown.
 std::string suffixOf(const std::string& fileName)
 {
     std::string suffix = std::filesystem::path(fileName).extension().string();
@@ -31,7 +31,7 @@ std::string suffixOf(const std::string& fileName)
     return suffix;
 }
 
-/// What gnuplot says is wrong, on one line: it shows the command above, with a mark below the place.
+/// gnuplot's error message on one line. gnuplot prints the command above it, with a mark below the place.
 std::string lastLine(const std::string& messages)
 {
     const std::size_t end = messages.find_last_not_of(" \n");
@@ -43,7 +43,7 @@ std::string lastLine(const std::string& messages)
     return "gnuplot says: " + printable(line.substr(std::min(line.find_first_not_of(' '), line.size())));
 }
 
-/// What gnuplot writes to its standard output. It is kept from the user's own settings.
+/// Returns gnuplot's standard output. gnuplot does not read the user's own settings.
 std::string draw(const std::string& fileName, const std::string& script)
 {
     try {
@@ -58,7 +58,7 @@ std::string draw(const std::string& fileName, const std::string& script)
     }
 }
 
-/// What those read who do not see the picture.
+/// Text alternative for readers who cannot see the picture.
 std::string description(const std::vector<Curve>& curves)
 {
     const std::vector<View> views = viewsOf(curves);
@@ -71,8 +71,7 @@ std::string description(const std::vector<Curve>& curves)
     return text + '.';
 }
 
-/// Puts a title and a description in the place of gnuplot's own, and takes away those of the parts, which a browser
-/// would show to whoever points at them.
+/// Replaces gnuplot's title and description, and removes those of the parts, which a browser would show as tooltips.
 std::string labelled(std::string svg, const std::string& title, const std::string& description)
 {
     std::size_t end = 0;

@@ -10,15 +10,15 @@
 
 namespace morvik::report {
 
-/// Throws std::runtime_error, saying why, unless writePlot can be expected to work: the file's suffix is .svg, .png or
-/// .pdf, its folder can be written to, and a gnuplot is installed that draws this format.
+/// Throws std::runtime_error with the reason unless writePlot can be expected to work: the file's suffix is .svg, .png
+/// or .pdf, its folder is writable, and the installed gnuplot supports the format.
 void checkPlot(const std::string& fileName);
 
 /// Draws BER and BLER against Eb/N0 in the format of the file's suffix, .svg, .png or .pdf. The file appears complete
 /// or not at all. Throws std::runtime_error.
 void writePlot(const std::string& fileName, const std::vector<Curve>& curves, const std::string& title);
 
-/// The same for a picture of shapes.
+/// The same for a drawing.
 void writeDrawing(const std::string& fileName, const Drawing& drawing);
 
 }  // namespace morvik::report

@@ -1,4 +1,4 @@
-// PlotScript: what gnuplot is told.
+// PlotScript: the gnuplot script of a plot.
 #include "PlotScript.h"
 
 #include <algorithm>
@@ -15,22 +15,22 @@ namespace {
 
 // The picture's layout, in points; all panels share its width.
 constexpr int width = pictureWidth;
-constexpr int headerHeight = 72;  // title and the panels' headings
+constexpr int headerHeight = 72;  // title and panel headings
 constexpr int panelHeight = 430;
-constexpr int axisHeight = 66;  // numbers and name of the horizontal axis
+constexpr int axisHeight = 66;  // tick labels and title of the horizontal axis
 constexpr int legendRowHeight = 22;
 constexpr int noteHeight = 34;
-constexpr int leftMargin = 62;  // of each panel, where its numbers are
+constexpr int leftMargin = 62;  // of each panel, for its tick labels
 constexpr int rightMargin = 18;
 
-// In characters, so that they stay within the picture.
+// In characters, so that text stays within the picture.
 constexpr std::size_t longestTitle = 95;
 constexpr std::size_t longestEntry = 110;  // of the legend
 constexpr int characterWidth = 7;
 constexpr int legendLine = 42;
-constexpr int legendSample = 72;  // what an entry takes besides its title: line and spaces
+constexpr int legendSample = 72;  // width of an entry besides its title: line and spaces
 
-constexpr double arrowLength = 0.4;  // a bound's arrow goes down to this fraction of it
+constexpr double arrowLength = 0.4;  // a bound's arrow ends at this fraction of it
 constexpr char ink[] = "#222222";
 constexpr char faintInk[] = "#666666";
 
@@ -45,13 +45,13 @@ struct Range {
     double to;
 };
 
-/// What a font and a marker of size 1 are called by a terminal, for they differ.
+/// Units in which a terminal measures font and marker sizes; terminals differ.
 struct Measures {
     double font;
     double point;
 };
 
-/// The terminals that draw with Cairo measure fonts in points, of which 72 are 96 of their pixels.
+/// The Cairo terminals measure fonts in points: 72 points are 96 of their pixels.
 Measures measuresOf(const std::string& suffix)
 {
     return suffix == ".svg" ? Measures{1, 0.85} : Measures{0.75, 1};
@@ -115,7 +115,7 @@ struct Band {
     int top;                        // of the panels
 };
 
-/// Whether some curve of the view has a line.
+/// Whether any curve of the view has a line.
 bool hasLines(const View& view)
 {
     return std::any_of(view.curves.begin(), view.curves.end(), [](const Curve& curve) {
@@ -131,7 +131,7 @@ public:
         itsText.imbue(std::locale::classic());
         const std::vector<View> views = viewsOf(curves);
         for (const View& view : views) {
-            if (views.size() == 1 || hasLines(view)) {  // at one Eb/N0 it is the iterations that show something
+            if (views.size() == 1 || hasLines(view)) {  // at a single Eb/N0, only the iterations vary
                 itsBands.emplace_back(view, (itsBands.empty() ? 0 : itsBands.back().bottom()) + headerHeight);
             }
         }
@@ -163,7 +163,7 @@ public:
     }
 
 private:
-    /// A place of the picture, counted from its upper left corner, as gnuplot counts: fractions, from below.
+    /// Coordinates as gnuplot counts them, in fractions from below; ours start at the upper left corner.
     std::string at(int x, int y) const
     {
         return "screen " + across(x) + ", screen " + up(y);
@@ -184,7 +184,7 @@ private:
         return exact(1 - static_cast<double>(y) / height());
     }
 
-    /// The blocks that the plot commands refer to.
+    /// The data blocks of the plot commands.
     static std::string lineData(const Band& band, const Quantity& quantity, std::size_t curve)
     {
         return "$" + band.name + "_" + quantity.name + "_" + std::to_string(curve);
@@ -211,7 +211,7 @@ private:
 
     void writeData(const Band& band, const Quantity& quantity, std::size_t curve)
     {
-        const double least = rateRange(band, quantity).from;  // zero has no place
+        const double least = rateRange(band, quantity).from;  // zero cannot be shown
         std::string lines;
         std::string bars;
         std::string bounds;
@@ -267,7 +267,7 @@ private:
         return {range.from - margin, range.to + margin};
     }
 
-    /// Whole decades, one at least, up to 1.
+    /// Whole decades, at least one, up to 1.
     static Range rateRange(const Band& band, const Quantity& quantity)
     {
         double least = 0.5;
@@ -340,7 +340,7 @@ private:
 
     std::string pointStyle(const Band& band, std::size_t curve) const
     {
-        const int open[markers] = {6, 4, 8, 12, 14};  // the next number is the filled one
+        const int open[markers] = {6, 4, 8, 12, 14};  // the next number is the filled marker
         const int marker = open[band.looks[curve].marker] + (band.curves[curve].reference ? 0 : 1);
         const double size = itsMeasures.point * (0.8 + 0.35 * static_cast<double>(band.looks[curve].layer));
         return colourOf(band, curve) + " lw 1.5 ps " + exact(size) + " pt " + std::to_string(marker);
@@ -367,7 +367,7 @@ private:
         }
     }
 
-    /// In the units of the layout, the whole picture being the plot.
+    /// In layout units, with the whole picture as the plot.
     void writeLegend(const Band& band)
     {
         itsText << "unset label\nunset border\nunset tics\nunset grid\nunset logscale\n"
@@ -388,7 +388,7 @@ private:
             const auto row = [y](int place) {
                 return std::to_string(place) + ' ' + std::to_string(y) + '\n';
             };
-            // The marker stands in the middle of three places.
+            // The marker is in the middle of three places.
             itsText << block << " << END\n"
                     << row(x) << row(x + legendLine / 2) << row(x + legendLine) << "END\n"
                     << "set label " << i + 2 << ' ' << quoted(legendTitle(band.curves[curve])) << " at "
@@ -399,7 +399,7 @@ private:
         itsText << "plot NaN notitle" << commands.str() << "\nunset label\n";
     }
 
-    /// Explains what is drawn besides lines and markers.
+    /// Explains everything drawn besides lines and markers.
     std::string note() const
     {
         const std::string bars = itsHasBars ? "Bars: 95 % confidence." : "";
@@ -416,13 +416,13 @@ private:
     std::ostringstream itsText;
 };
 
-/// Size of the picture, scale of its lines, and the font in the terminal's measure.
+/// Size of the picture, scale of its lines, and the font in the terminal's units.
 std::string terminalOptions(const std::string& suffix, int height)
 {
     if (suffix == ".svg") {
         return " size " + std::to_string(width) + ',' + std::to_string(height);
     }
-    if (suffix == ".png") {  // two pixels for each point
+    if (suffix == ".png") {  // two pixels per point
         return " size " + std::to_string(2 * width) + ',' + std::to_string(2 * height) +
                " fontscale 2 linewidth 2 pointscale 2";
     }

@@ -1,4 +1,4 @@
-// Reference: curves to compare with, from CSV files and results.
+// Reference: reference curves, from CSV files and results.
 #include "Reference.h"
 
 #include <charconv>
@@ -100,7 +100,7 @@ private:
         }
     }
 
-    /// Calls a column by the name that is used here, unless another has it.
+    /// Renames a column to the name used here, unless another column has it.
     void nameAlike(const std::string& other, const std::string& name)
     {
         const auto index = indexOf(other);
@@ -158,7 +158,7 @@ private:
         return sample;
     }
 
-    /// What is unknown agrees with anything.
+    /// An unknown value matches anything.
     void checkBounds(const std::string& column, double rate, double low, double high) const
     {
         if (low > rate || rate > high || low > high) {
@@ -193,7 +193,7 @@ private:
         return std::nullopt;
     }
 
-    /// What the row has in a column; empty where there is no such column.
+    /// The row's field in a column; empty if there is no such column.
     std::string text(const std::string& column) const
     {
         const auto index = indexOf(column);
@@ -228,7 +228,7 @@ private:
         return *value;
     }
 
-    /// The curves as references, named after the file, too.
+    /// The curves as references, with the file name in their titles.
     std::vector<Curve> titled(std::vector<Curve> curves) const
     {
         const std::string name =

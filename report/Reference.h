@@ -1,4 +1,4 @@
-// Reference: curves to compare with, from CSV files and results.
+// Reference: reference curves, from CSV files and results.
 #ifndef MORVIK_REPORT_REFERENCE_H
 #define MORVIK_REPORT_REFERENCE_H
 
@@ -12,11 +12,11 @@ namespace morvik::report {
 /// Reads published error rates or results of `morvik ber`, both CSV with comment lines that begin with #; results as
 /// JSON, too, if the name ends in .json.
 ///
-/// The first line that is no comment names the columns, in any order: ebn0_db, and one of ber, bler and fer at least
-/// (fer is another name of bler). Read as well, if they are there: blocks or else frames, bit_errors, block_errors or
-/// frame_errors, ber_low, ber_high, bler_low, bler_high and clipped_fraction. Rows are told apart by block_size,
-/// num_pu, algorithm, iterations and scale_option (see curvesOf); other columns are ignored. A comment "# title: TEXT"
-/// names the curve, otherwise the file's name does.
+/// The first line that is not a comment names the columns, in any order: ebn0_db, and at least one of ber, bler and fer
+/// (another name of bler). Optional columns: blocks or else frames, bit_errors, block_errors or frame_errors, ber_low,
+/// ber_high, bler_low, bler_high and clipped_fraction. block_size, num_pu, algorithm, iterations and scale_option
+/// separate the rows into curves (see curvesOf); other columns are ignored. A comment "# title: TEXT" names the curve,
+/// otherwise the file name does.
 ///
 /// Throws std::runtime_error with one line that begins with the place, FILE or FILE:LINE.
 std::vector<Curve> readReference(const std::string& fileName);

@@ -1,4 +1,4 @@
-// Series: what of the curves can be drawn, and how series look: the same in plots and on pages.
+// Series: which curves can be drawn, and how they look, in plots and on pages alike.
 #include "Series.h"
 
 #include <algorithm>
@@ -44,7 +44,7 @@ const Colour referenceColour = {"#6b6b6b", "#a8a8a8"};
 
 namespace {
 
-/// Whether the places of both are the same to the eye.
+/// Whether both are at the same place to the eye.
 bool areAlike(const Rate& a, const Rate& b)
 {
     if (!a.canBeDrawn() || !b.canBeDrawn() || a.below != b.below) {
@@ -56,7 +56,7 @@ bool areAlike(const Rate& a, const Rate& b)
 
 using Rgb = std::array<int, 3>;
 
-/// Colours at equal distances on the way that a family's colours take.
+/// Colours at equal distances along the colour gradient of a family.
 using Way = std::array<Rgb, 4>;
 struct Run {
     Way onLight;
@@ -71,7 +71,7 @@ constexpr Run runs[] = {
      {{{132, 66, 172}, {190, 96, 190}, {234, 150, 208}, {252, 224, 240}}}},
 };
 
-/// The colour at a place of the way, 0 to 1.
+/// The colour at a position along the gradient, 0 to 1.
 std::string colourAt(const Way& way, double place)
 {
     const double scaled = place * static_cast<double>(way.size() - 1);
@@ -86,9 +86,9 @@ std::string colourAt(const Way& way, double place)
     return text;
 }
 
-/// Where a curve stands in its family.
+/// A curve's rank in its family.
 struct Rank {
-    std::size_t family = 0;  // how many families with colours of their own come before
+    std::size_t family = 0;  // number of earlier families with their own colours
     std::size_t index = 0;
     std::size_t size = 0;
 };
@@ -98,7 +98,7 @@ bool areFamily(const Curve& a, const Curve& b)
     return a.reference == b.reference && !a.family.empty() && a.family == b.family;
 }
 
-/// How many of the first curves, up to but without `end`, are of a curve's family.
+/// The number of curves before `end` in the curve's family.
 std::size_t relatives(const std::vector<Curve>& curves, std::size_t curve, std::size_t end)
 {
     return static_cast<std::size_t>(std::count_if(curves.begin(),
@@ -123,7 +123,7 @@ Colour colourIn(const Rank& rank)
     return {colourAt(run.onLight, place), colourAt(run.onDark, place)};
 }
 
-/// Whether most points of a curve are points of the other as well.
+/// Whether most points of the lower curve coincide with points of the upper one.
 bool covers(const Curve& above, const Curve& below, const Axis& axis)
 {
     const auto alike = std::count_if(below.samples.begin(), below.samples.end(), [&](const Sample& sample) {
@@ -160,7 +160,7 @@ Look lookOf(const std::vector<Curve>& curves, std::size_t curve, const Axis& axi
     }
     const Rank rank = rankOf(curves, curve);
     if (rank.size >= smallestRun) {
-        // What covers it is of nearly the same colour, which alone tells no neighbours apart.
+        // Curves that cover it have nearly the same colour, so layers would not tell neighbours apart.
         return {colourIn(rank), before % markers, before / markers % dashes, 0};
     }
     constexpr std::ptrdiff_t mostLayers = 3;

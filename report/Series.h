@@ -1,4 +1,4 @@
-// Series: what of the curves can be drawn, and how series look: the same in plots and on pages.
+// Series: which curves can be drawn, and how they look, in plots and on pages alike.
 #ifndef MORVIK_REPORT_SERIES_H
 #define MORVIK_REPORT_SERIES_H
 
@@ -17,7 +17,7 @@ struct Rate {
     double high;
     bool below;
 
-    /// There is a place for it on a logarithmic axis: of a rate that is not zero, or of a bound that it is below.
+    /// It can be drawn on a logarithmic axis: a non-zero rate, or the upper bound of one.
     bool canBeDrawn() const;
 
     /// The interval is known.
@@ -34,12 +34,12 @@ struct Quantity {
 extern const Quantity bitErrorRate;
 extern const Quantity blockErrorRate;
 
-/// What curves are drawn against.
+/// The horizontal axis of curves.
 struct Axis {
     const char* name;   // "ebn0"
     const char* title;  // "Eb/N0"
-    const char* label;  // the title and its unit, for gnuplot
-    bool isWhole;       // there are whole numbers alone
+    const char* label;  // title and unit, for gnuplot
+    bool isWhole;       // integers only
     double (*of)(const Sample& sample);
 };
 
@@ -52,13 +52,13 @@ struct View {
     std::vector<Curve> curves;  // in order
 };
 
-/// The curves against Eb/N0 and, where some were counted after several iterations, against these, too. More curves than
-/// can be told apart are no view against iterations.
+/// The curves against Eb/N0 and, if some were counted after several iterations, against iterations, too. There is no
+/// view against iterations if it would have too many curves to tell apart.
 std::vector<View> viewsOf(const std::vector<Curve>& curves);
 
-/// Colours that tell series apart on white paper and on dark screens, for colour-blind eyes, too: those of M. Okabe and
-/// K. Ito, without the yellow, which white swallows. Series of the same colour differ in marker, whose number is not a
-/// multiple of that of colours, and in dash. References are grey.
+/// Colours that distinguish series on white paper and on dark screens, for colour-blind eyes, too: those of M. Okabe
+/// and K. Ito, without yellow, which is hard to see on white. Series of the same colour differ in marker, as the number
+/// of markers is not a multiple of the number of colours, and in dash. References are grey.
 struct Colour {
     std::string onLight;
     std::string onDark;
@@ -72,8 +72,8 @@ constexpr std::size_t markers = 5;
 /// The number of dashes, the first of which is solid. References are never solid.
 constexpr std::size_t dashes = 4;
 
-/// A family of at least so many curves has colours that run from one to another, from bright to dark on paper and from
-/// dark to bright on screens. Neighbours are alike in them, so that marker and dash together tell 20 curves apart.
+/// A family of at least this many curves is coloured along a gradient, from bright to dark on paper and from dark to
+/// bright on screens. Neighbours have similar colours, so marker and dash together distinguish 20 curves.
 constexpr std::size_t smallestRun = 4;
 
 /// How a curve is drawn.
@@ -81,11 +81,11 @@ struct Look {
     Colour colour;
     std::size_t marker;
     std::size_t dash;   // 0 is solid
-    std::size_t layer;  // how many of the curves drawn later cover it: it is broader, to show on both sides of them
+    std::size_t layer;  // number of later curves that cover it: it is drawn broader, to show on both sides of them
 };
 Look lookOf(const std::vector<Curve>& curves, std::size_t curve, const Axis& axis = ebn0Axis);
 
-/// The curves with the references behind the others.
+/// The curves, references last.
 std::vector<Curve> inOrder(const std::vector<Curve>& curves);
 
 }  // namespace morvik::report

@@ -1,4 +1,4 @@
-// Wording: texts and figures as plots and pages show them, whatever the locale.
+// Wording: strings and figures as plots and pages show them, independent of the locale.
 #include "Wording.h"
 
 #include <algorithm>

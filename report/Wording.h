@@ -1,4 +1,4 @@
-// Wording: texts and figures as plots and pages show them, whatever the locale.
+// Wording: strings and figures as plots and pages show them, independent of the locale.
 #ifndef MORVIK_REPORT_WORDING_H
 #define MORVIK_REPORT_WORDING_H
 
@@ -8,29 +8,28 @@
 
 namespace morvik::report {
 
-/// The text as valid UTF-8 on one line: a blank in the place of each control character, and ? for each byte that
-/// makes no character.
+/// The string as valid UTF-8 on one line: a blank for each control character, and ? for each invalid byte.
 std::string printable(std::string_view text);
 
-/// The printable text with what XML and HTML take as markup escaped, quotation marks too.
+/// The printable string with XML and HTML markup escaped, including quotation marks.
 std::string escaped(std::string_view text);
 
-/// At most so many characters of a printable text, the last being an ellipsis where it was cut.
+/// The printable string cut to at most the given number of characters, ending in an ellipsis if it was cut.
 std::string shortened(const std::string& text, std::size_t most);
 
-/// The number of characters of a printable text.
+/// The number of characters of a printable string.
 std::size_t characters(std::string_view text);
 
-/// Eb/N0 in dB with two decimals, three where they are needed: "1.20", "0.125".
+/// Eb/N0 in dB with two decimals, or three if needed: "1.20", "0.125".
 std::string decibels(double value);
 
-/// Three digits of a rate: "1.30e-03".
+/// A rate with three digits: "1.30e-03".
 std::string rate(double value);
 
-/// A count, its digits in groups of three with narrow spaces between them.
+/// A count, with its digits in groups of three separated by narrow spaces.
 std::string grouped(std::uint64_t count);
 
-/// All the digits that a program needs; the value is finite.
+/// With all the digits that a program needs; the value is finite.
 std::string exact(double value);
 
 }  // namespace morvik::report
