@@ -1,4 +1,4 @@
-// Clock: processor time of this thread, and how many cycles a second of it has.
+// Clock: processor time of this thread, and its cycles per second.
 #ifndef MORVIK_BENCH_CLOCK_H
 #define MORVIK_BENCH_CLOCK_H
 
@@ -7,7 +7,7 @@
 
 namespace morvik::bench {
 
-/// Processor time that this thread has used, in seconds.
+/// Processor time used by this thread, in seconds.
 inline double processorTime()
 {
     std::timespec time = {};
@@ -15,8 +15,8 @@ inline double processorTime()
     return static_cast<double>(time.tv_sec) + 1e-9 * static_cast<double>(time.tv_nsec);
 }
 
-/// Cycles a second, by a chain of additions that each wait for the one before: one cycle for each. They
-/// add registers, because some processors add constants while they rename registers, at no cost.
+/// Cycles per second, measured by a chain of dependent additions, one cycle each. They add registers, because some
+/// processors execute the addition of a constant in register renaming, at no cost.
 inline double cyclesPerSecond()
 {
     constexpr unsigned rounds = 40000;
@@ -29,13 +29,13 @@ inline double cyclesPerSecond()
     return double{rounds} * additions / (processorTime() - start);
 }
 
-/// What one call took.
+/// The cost of one call.
 struct Sample {
     double seconds;
     double cycles;
 };
 
-/// Measures some calls; the clock is measured just before and just after them.
+/// Measures some calls; the clock frequency is measured just before and just after them.
 class Stopwatch {
 public:
     Stopwatch() : itsClock(cyclesPerSecond()), itsStart(processorTime()) {}

@@ -22,9 +22,9 @@ itpp::ivec lteInterleaver(unsigned K)
     return sequence;
 }
 
-/// A block as IT++ takes it: the three streams position by position, a positive value for bit 0. After the
-/// data IT++ expects each encoder's tail as x z x z x z, which is what 3GPP TS 36.212, clause 5.1.3.2.2,
-/// spreads over the last four positions in the same order.
+/// A block in IT++'s input format: the three streams position by position, a positive value for bit 0. After the data
+/// IT++ expects each encoder's tail as x z x z x z; 3GPP TS 36.212, clause 5.1.3.2.2, spreads the same order over the
+/// last four positions.
 itpp::vec received(const NoisyBlocks& blocks, unsigned block, unsigned K)
 {
     const unsigned positions = K + 4;
@@ -39,7 +39,7 @@ class ItppDecoding : public Decoding {
 public:
     explicit ItppDecoding(const Work& work) : Decoding(work)
     {
-        const itpp::ivec generators = "11 13";  // octal 13, fed back, and octal 15
+        const itpp::ivec generators = "11 13";  // octal 13, feedback, and octal 15
         constexpr int constraintLength = 4;
         itsCodec.set_parameters(generators,
                                 generators,
@@ -76,7 +76,7 @@ private:
         return to;
     }
 
-    /// A wrong order of its input would only look like a bad decoder.
+    /// Without this check, a wrong input order would only look like a bad decoder.
     void checkWithoutNoise()
     {
         const NoisyBlocks clean = cleanBlocks(itsWork.blockSize, 1);

@@ -1,4 +1,4 @@
-// Limits: what the probe shows to be possible on this machine, in this run.
+// Limits: the limit of this machine, as measured by the probe in this run.
 #include "Limits.h"
 
 #include <cstddef>
@@ -9,7 +9,7 @@
 #include "lanes/InstructionSets.h"
 #include "src/Segmentation.h"
 
-// One compilation of Probe.cpp defines each.
+// Each compilation of Probe.cpp defines one of these.
 namespace probe_generic {
 extern const morvik::bench::ProbeSet probeSet;
 }
@@ -49,17 +49,17 @@ const lanes::InstructionSet* instructionSet(const std::string& name)
     return nullptr;
 }
 
-/// Lanes of the vectors that the work is done on.
+/// Lanes of the vectors used by the work.
 unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
 {
-    constexpr std::uint64_t threads = 4;  // of each processing unit
+    constexpr std::uint64_t threads = 4;  // per processing unit
     const unsigned segments = segmentation::segmentCount(work.blockSize, threads * static_cast<unsigned>(work.units));
     return lanes::kernelFor(set, segments, work.call == Work::Call::batch ? work.blocks : 1).vectorLanes;
 }
 
 }  // namespace
 
-/// The probes take turns, so that what disturbs the machine for a moment spoils few samples of each.
+/// The probes alternate, so that a short disturbance of the machine spoils few samples of each.
 Limits::Limits()
 {
     constexpr unsigned repetitions = 9;

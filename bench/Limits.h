@@ -1,4 +1,4 @@
-// Limits: what the probe shows to be possible on this machine, in this run.
+// Limits: the limit of this machine, as measured by the probe in this run.
 #ifndef MORVIK_BENCH_LIMITS_H
 #define MORVIK_BENCH_LIMITS_H
 
@@ -14,7 +14,7 @@ public:
     struct Limit {
         std::string instructionSet;
         unsigned lanes;  ///< of a vector
-        double cycles;   ///< for a step of the forward recursion in 16 lanes
+        double cycles;   ///< per step of the forward recursion in 16 lanes
     };
 
     /// Runs the probe at every width of every instruction set of this machine.
@@ -25,7 +25,7 @@ public:
         return itsLimits;
     }
 
-    /// Cycles of a step in 16 lanes for the vectors that this work is done on; 0 where it takes no lanes.
+    /// Cycles per step in 16 lanes for the vectors used by this work; 0 if it does not use lanes.
     double cyclesPerStep(const Work& work) const;
 
 private:

@@ -1,4 +1,4 @@
-// Measure: from samples to the figures of a line.
+// Measure: computes the figures of a line from its samples.
 #include "Measure.h"
 
 #include <algorithm>
@@ -15,7 +15,7 @@ double median(std::vector<double> values)
 
 Figures figures(const Work& work, const Decoding& decoding, const Sample& sample, double limit)
 {
-    // A bit takes a step of two passes in each iteration, and a probe's step is that of 16 lanes.
+    // An iteration takes two steps per bit, one in each pass; a probe step is for 16 lanes.
     constexpr double passes = 2;
     constexpr double lanes = 16;
     const double bits = 1.0 * work.blocks * work.blockSize;

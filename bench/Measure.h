@@ -1,4 +1,4 @@
-// Measure: from samples to the figures of a line.
+// Measure: computes the figures of a line from its samples.
 #ifndef MORVIK_BENCH_MEASURE_H
 #define MORVIK_BENCH_MEASURE_H
 
@@ -12,22 +12,22 @@ namespace morvik::bench {
 struct Figures {
     double megabitsPerSecond;
     double cyclesPerBitAndIteration;
-    double latency;  ///< of a call, in microseconds of processor time
-    double ratio;    ///< of a pass's step to one of the probe; 0 when there is no probe for it
+    double latency;  ///< per call, in microseconds of processor time
+    double ratio;    ///< of a step of a pass to a probe step; 0 without a probe
     double bitErrorRate;
 };
 
-/// The middle one, or of an even number the mean of the two in the middle; takes one value or more.
+/// The median, of one or more values.
 double median(std::vector<double> values);
 
-/// The figures of one sample, of a run over all blocks.
+/// The figures of one sample, a run over all blocks.
 Figures figures(const Work& work, const Decoding& decoding, const Sample& sample, double limit);
 
-/// Each figure's median.
+/// The median of each figure.
 Figures medians(const std::vector<Figures>& all);
 
-/// Throws when the decisions are so bad that the figures stand for nothing: without a decoder, more than
-/// every sixth bit would be wrong.
+/// Throws if the decisions are so bad that the figures are meaningless: without a decoder, more than every sixth bit
+/// would be wrong.
 void checkDecisions(const Work& work, double bitErrorRate);
 
 }  // namespace morvik::bench

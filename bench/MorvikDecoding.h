@@ -1,4 +1,4 @@
-// MorvikDecoding: the library at work, through its C interfaces.
+// MorvikDecoding: decoding by the library, through its C interfaces.
 #ifndef MORVIK_BENCH_MORVIKDECODING_H
 #define MORVIK_BENCH_MORVIKDECODING_H
 

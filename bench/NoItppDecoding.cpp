@@ -1,4 +1,4 @@
-// NoItppDecoding: in the place of ItppDecoding where IT++ is not installed.
+// NoItppDecoding: replaces ItppDecoding if IT++ is not installed.
 #include <stdexcept>
 
 #include "ItppDecoding.h"

@@ -1,4 +1,4 @@
-// NoisyBlocks: the code blocks that all decoders are measured on.
+// NoisyBlocks: the code blocks on which all decoders are measured.
 #include "NoisyBlocks.h"
 
 #include <algorithm>
@@ -10,7 +10,7 @@ namespace morvik::bench {
 
 namespace {
 
-/// Of a soft value without noise, in steps: a received amplitude of 1.25.
+/// A noiseless soft value, in steps, for a received amplitude of 1.25.
 constexpr int amplitude = 10;
 
 NoisyBlocks makeBlocks(unsigned K, unsigned count, double deviation)

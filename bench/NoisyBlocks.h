@@ -1,4 +1,4 @@
-// NoisyBlocks: the code blocks that all decoders are measured on.
+// NoisyBlocks: the code blocks on which all decoders are measured.
 #ifndef MORVIK_BENCH_NOISYBLOCKS_H
 #define MORVIK_BENCH_NOISYBLOCKS_H
 
@@ -8,8 +8,8 @@
 
 namespace morvik::bench {
 
-/// Codewords of one size, the same ones in every run, as soft values of the core's input format; the
-/// three streams block after block, K + 4 values each.
+/// Codewords of one size, the same in every run, as soft values of the core's input format; the three streams block
+/// after block, K + 4 values each.
 struct NoisyBlocks {
     std::vector<std::uint8_t> sent;
     std::array<std::vector<std::int32_t>, 3> streams;

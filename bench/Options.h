@@ -1,4 +1,4 @@
-// Options: what both programs take from the command line.
+// Options: the command line options of both programs.
 #ifndef MORVIK_BENCH_OPTIONS_H
 #define MORVIK_BENCH_OPTIONS_H
 

@@ -1,4 +1,4 @@
-// Probe: the plain forward recursion; compiled once for each instruction set, as lanes/Kernels.cpp is.
+// Probe: the plain forward recursion; compiled once for each instruction set, like lanes/Kernels.cpp.
 #include "Probe.h"
 
 #include <cstddef>
@@ -17,16 +17,16 @@ struct Loop {
     using Value = Steps<count>;
     using Decision = trellis::DecideMax<Value>;
 
-    /// A slot for each step: its eight forward metrics and two branch metrics, each of which serves two
-    /// pairs of states, because LTE has no second parity stream. Side by side, a step's loads never look
-    /// to the processor like another step's stores, at an address that is equal in the low 12 bits.
+    /// A slot for each step: its eight forward metrics and two branch metrics, each of which serves two pairs of
+    /// states, because LTE has no second parity stream. They are adjacent, so that the loads of one step never alias
+    /// stores of another in the low 12 address bits.
     static constexpr std::size_t slot = (states + 2) * count;
     alignas(64) static inline std::int16_t slots[morvik::bench::Probe::steps * slot];
 
     static __attribute__((flatten, noinline)) void run(unsigned rounds)
     {
         for (unsigned round = 0; round < rounds; ++round) {
-            asm volatile("" ::"r"(slots) : "memory");  // as if somebody else filled and read them
+            asm volatile("" ::"r"(slots) : "memory");  // as if other code read and wrote them
             trellis::Column<Decision> a{};
             for (std::int16_t* to = slots; to != slots + morvik::bench::Probe::steps * slot; to += slot) {
                 const Value g0 = Value::load(to + states * count);

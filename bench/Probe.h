@@ -4,13 +4,13 @@
 
 namespace morvik::bench {
 
-/// The loop at one width, a vector of so many lanes.
+/// The loop at one vector width, in lanes.
 struct Probe {
     unsigned lanes;
     /// Runs `rounds` times over `steps` steps.
     void (*run)(unsigned rounds);
 
-    /// So few that branch metrics and forward metrics of the widest vectors stay in the first cache.
+    /// Few enough that branch and forward metrics of the widest vectors stay in the L1 cache.
     static constexpr unsigned steps = 32;
 };
 

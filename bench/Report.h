@@ -9,14 +9,14 @@
 
 namespace morvik::bench {
 
-/// Prints lines as they come; each table begins with its first line.
+/// Prints lines as they come; a table's header comes with its first line.
 class Report {
 public:
     Report(std::ostream& os, const Limits& limits);
 
     void add(const Work& work, const Figures& figures);
 
-    /// What stands below the tables.
+    /// Prints what follows the tables.
     void finish();
 
 private:

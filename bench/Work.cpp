@@ -1,4 +1,4 @@
-// Work: the decoding that is measured.
+// Work: the decoding jobs to measure.
 #include "Work.h"
 
 #include <cstddef>
@@ -14,7 +14,7 @@ namespace {
 
 using Call = Work::Call;
 
-/// Every number of units and algorithm type on the longest block, then short blocks.
+/// Every number of units and algorithm type for the longest block, then short blocks.
 void addBest(std::vector<Work>& all, const std::string& best)
 {
     for (const Call call : {Call::single, Call::batch}) {

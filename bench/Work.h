@@ -1,4 +1,4 @@
-// Work: the decoding that is measured.
+// Work: the decoding jobs to measure.
 #ifndef MORVIK_BENCH_WORK_H
 #define MORVIK_BENCH_WORK_H
 
@@ -11,7 +11,7 @@
 
 namespace morvik::bench {
 
-/// Full iterations of every line.
+/// Full iterations, the same for every line.
 constexpr unsigned iterations = 6;
 
 /// One line of a table.
@@ -20,27 +20,27 @@ struct Work {
     enum class Call { single, batch };
 
     unsigned blockSize;
-    int units;      ///< of morvik, as the next three
+    int units;      ///< of morvik, like the next three
     int algorithm;  ///< type 0, 1 or 2
     Call call;
     std::string instructionSet;  ///< a name of the batch header
-    unsigned blocks;             ///< that are decoded at a time
+    unsigned blocks;             ///< decoded at a time
     Decoder decoder = Decoder::morvik;
-    bool compared = false;  ///< belongs to the comparison of decoders
+    bool compared = false;  ///< part of the comparison of decoders
 
     std::string name() const;
 
-    /// How many calls a run makes.
+    /// Calls per run.
     unsigned calls() const
     {
         return call == Call::batch ? 1 : blocks;
     }
 };
 
-/// The lines of all tables, in order, for the instruction sets that this machine has.
+/// The lines of all tables, in order, for the instruction sets of this machine.
 std::vector<Work> allWork();
 
-/// A decoder and the blocks that it is to decode.
+/// A decoder and its input blocks.
 class Decoding {
 public:
     virtual ~Decoding() = default;
@@ -50,7 +50,7 @@ public:
     /// Decodes all blocks once.
     virtual void run() = 0;
 
-    /// Share of the decided bits that differ from the ones sent.
+    /// Fraction of the decided bits that differ from the transmitted ones.
     double bitErrorRate() const;
 
 protected:
@@ -61,7 +61,7 @@ protected:
     std::vector<std::uint8_t> itsDecisions;  ///< block after block
 };
 
-/// Throws when the work cannot be done.
+/// Throws if the work cannot be done.
 std::unique_ptr<Decoding> makeDecoding(const Work& work);
 
 }  // namespace morvik::bench

@@ -1,4 +1,4 @@
-// morvik_bench: the same lines as benchmarks of Google Benchmark, which writes them to JSON as well.
+// morvik_bench: the same lines through Google Benchmark, which also writes them as JSON.
 #include <benchmark/benchmark.h>
 
 #include <iostream>
@@ -12,7 +12,7 @@ namespace {
 using morvik::bench::Figures;
 using morvik::bench::Work;
 
-/// The figures as Google Benchmark keeps them.
+/// The figures as Google Benchmark counters.
 constexpr struct {
     const char* name;
     double Figures::*figure;
@@ -42,7 +42,7 @@ void measure(benchmark::State& state, const Work& work, double limit)
     }
 }
 
-/// Hands each line's medians to the report.
+/// Passes the medians of each line to the report.
 class Reporter : public benchmark::BenchmarkReporter {
 public:
     Reporter(morvik::bench::Report& report, const std::vector<Work>& all) : itsReport(report)
@@ -100,7 +100,7 @@ int runBenchmarks(const std::vector<Work>& all)
     return none || reporter.failed() ? 1 : 0;
 }
 
-/// The options in the words of Google Benchmark, and then arguments of its own.
+/// Our options translated to those of Google Benchmark, followed by its own.
 std::vector<std::string> benchmarkArguments(const morvik::bench::Options& options,
                                             const std::string& json,
                                             const std::vector<std::string>& others)
@@ -120,7 +120,7 @@ std::vector<std::string> benchmarkArguments(const morvik::bench::Options& option
     return arguments;
 }
 
-/// Google Benchmark keeps pointers to the arguments. False after lines on those that it does not know.
+/// Google Benchmark keeps pointers to the arguments. Returns false after error messages about unknown ones.
 bool initialise(std::vector<std::string>& arguments)
 {
     std::vector<char*> argv;

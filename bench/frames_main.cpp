@@ -1,4 +1,4 @@
-// morvik_bench_frames: measures what it takes to make the frames of a simulation, beside decoding them.
+// morvik_bench_frames: compares the cost of making the frames of a simulation with that of decoding them.
 #include <CLI/CLI.hpp>
 #include <iomanip>
 #include <iostream>
@@ -19,7 +19,7 @@ constexpr int milliDecibels = 1000;
 constexpr double scale = 8;
 constexpr std::uint64_t seed = 1;
 
-/// Frames of one size, made and decoded `count` at a time, by stages or as a whole.
+/// Frames of one size, made and decoded `count` at a time, in separate stages or as a whole.
 class Stages {
 public:
     Stages(unsigned K, unsigned count, const SamplerForm& form)
@@ -84,7 +84,7 @@ public:
                                                 &outputs);
     }
 
-    /// Cycles for an information bit, the median of the repetitions.
+    /// Cycles per information bit, the median of the repetitions.
     double cycles(void (Stages::*stage)(), const morvik::bench::Options& options)
     {
         const morvik::bench::Stopwatch once;

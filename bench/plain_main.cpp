@@ -1,4 +1,4 @@
-// morvik_bench_plain: measures and prints the tables, on nothing but the library.
+// morvik_bench_plain: measures and prints the tables; needs only the library.
 #include <exception>
 #include <iostream>
 #include <regex>

@@ -9,7 +9,7 @@ fail() {
     echo "$output" >&2
     exit 1
 }
-# expect COUNT WHAT REGEX: so many lines look like this.
+# expect COUNT WHAT REGEX: COUNT lines match REGEX.
 expect() {
     [ "$(grep -cE "$3" <<<"$output")" = "$1" ] || fail "not $1 $2"
 }

@@ -1,10 +1,10 @@
-"""Distances between curves of block error rates, in dB, and how exact they are."""
+"""Distances between BLER curves in dB, and their uncertainty."""
 
 import csv
 import math
 from typing import NamedTuple
 
-CONFIDENCE = 1.96  # standard deviations to either side of a 95 % interval
+CONFIDENCE = 1.96  # standard deviations on either side, for a 95 % interval
 
 
 class Point(NamedTuple):
@@ -18,12 +18,12 @@ class Point(NamedTuple):
 
     @property
     def log_deviation(self):
-        """The standard deviation of the rate's logarithm: errors are binomial."""
+        """The standard deviation of the rate's logarithm; errors are binomial."""
         return math.sqrt((1 - self.rate) / self.errors)
 
 
 class Estimate(NamedTuple):
-    """A number of dB and its standard deviation."""
+    """A value in dB and its standard deviation."""
     db: float
     deviation: float
 
@@ -32,7 +32,7 @@ class Estimate(NamedTuple):
         return Estimate(self.db - other.db, math.hypot(self.deviation, other.deviation))
 
     def __str__(self):
-        rounded = round(self.db, 3) + 0.0  # which makes -0 a 0
+        rounded = round(self.db, 3) + 0.0  # turns -0 into 0
         return f"{rounded:.3f} ± {CONFIDENCE * self.deviation:.3f}"
 
 
@@ -49,7 +49,7 @@ def bracket(points, rate):
 
 
 def slope(left, right):
-    """Of the rate's logarithm, for each dB: below 0."""
+    """The slope of the rate's logarithm per dB; negative."""
     return math.log(right.rate / left.rate) / (right.ebn0_db - left.ebn0_db)
 
 
@@ -59,7 +59,7 @@ def interpolated(left_deviation, right_deviation, way):
 
 
 def crossing(points, rate):
-    """The Eb/N0 at which a curve has a rate; None when the points do not reach it."""
+    """The Eb/N0 at which a curve reaches a rate; None if the points do not reach it."""
     found = bracket(points, rate)
     if found is None:
         return None
@@ -83,7 +83,7 @@ def paired_step(before, after, disagreements, rate):
 
 
 def read_rows(path):
-    """The rows of a CSV file behind its comment lines, by the names of the columns."""
+    """The rows of a CSV file after its comment lines, keyed by column name."""
     with open(path, encoding="utf-8", newline="") as file:
         return list(csv.DictReader(line for line in file if not line.startswith("#")))
 
@@ -94,7 +94,7 @@ def read_reference(path):
 
 
 def read_curves(path, *keys):
-    """The curves of a result file, by the values of the columns that `keys` names."""
+    """The curves of a result file, keyed by the values of the columns in `keys`."""
     curves = {}
     for row in read_rows(path):
         point = Point(float(row["ebn0_db"]), int(row["blocks"]), int(row["block_errors"]))

@@ -11,14 +11,14 @@ import sys
 import tempfile
 import unittest
 
-sys.dont_write_bytecode = True  # the tree stays as it is
+sys.dont_write_bytecode = True  # writes no bytecode into the tree
 from distances import Estimate, Point, crossing, paired_step, read_curves, read_reference
 from needed import ITERATIONS, SIMULATIONS, TYPES, needed, pictures
 from validate import DOCUMENT, RESULTS, with_tables
 
 
 def curve(start, per_decade, blocks=1000000):
-    """Points every 0.5 dB of a rate that is 1 at `start` dB and falls tenfold every `per_decade` dB."""
+    """Points every 0.5 dB; the rate is 1 at `start` dB and falls by a factor of ten every `per_decade` dB."""
     return [Point(db, blocks, round(blocks * 10 ** (-(db - start) / per_decade))) for db in (1, 1.5, 2, 2.5, 3)]
 
 
@@ -71,7 +71,7 @@ class PairedStep(unittest.TestCase):
         self.assertEqual(step.deviation, 0)
 
     def test_deviation_is_that_of_repeated_simulations(self):
-        both, one = {1.0: 0.28, 1.5: 0.025}, {1.0: 0.02, 1.5: 0.005}  # both fail; one alone fails, either
+        both, one = {1.0: 0.28, 1.5: 0.025}, {1.0: 0.02, 1.5: 0.005}  # both fail; exactly one fails
         draw = random.Random(2)
 
         def simulated():
@@ -85,7 +85,7 @@ class PairedStep(unittest.TestCase):
             return paired_step(before, after, disagreements, 0.1)
 
         found = [simulated() for _ in range(300)]
-        spread = math.sqrt(sum(step.db ** 2 for step in found) / len(found))  # the curves are the same
+        spread = math.sqrt(sum(step.db ** 2 for step in found) / len(found))  # the curves are equal
         expected = math.sqrt(sum(step.deviation ** 2 for step in found) / len(found))
         self.assertLess(abs(spread / expected - 1), 0.15)
 

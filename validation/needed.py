@@ -16,7 +16,7 @@ from needed_plot import TYPES, draw_undivided, draw_units
 
 RATE = 0.01
 UNITS = ("2", "4", "8")
-ITERATIONS = (8, 6, 4, 3)  # from the least Eb/N0 to the greatest: a search goes on where the one before it ended
+ITERATIONS = (8, 6, 4, 3)  # ascending Eb/N0: each search starts where the previous one ended
 KEYS = ("block_size", "algorithm", "iterations")
 
 
@@ -32,7 +32,7 @@ UNDIVIDED_SCOPE = Scope((128, 512, 2048, 6144), 6_000_000)
 
 
 def step_of(size):
-    """The distance of points, in thousandths of a decibel: short enough that a straight line meets the curve."""
+    """The spacing of points, in thousandths of a dB: small enough for linear interpolation."""
     return 200 if size < 512 else 100 if size < 2048 else 50
 
 
@@ -68,7 +68,7 @@ def bracketed(start, step, rates):
 
 
 def different_units(programs, size):
-    """Those numbers of units that do not divide blocks as a smaller number does."""
+    """The numbers of units that do not divide blocks like a smaller number does."""
     layout = json.loads(subprocess.run([programs / "morvik", "info", str(size), "--json"], check=True,
                                        capture_output=True).stdout)
     kept = {}
@@ -100,7 +100,7 @@ def hardware_rates(programs, scope, size, algorithm, iterations):
 
 
 def undivided_rates(programs, scope, size, algorithm, iterations):
-    """Simulates points of the decoder with the hardware's numbers and neither segments nor windows."""
+    """Simulates points of the decoder with the hardware's number formats and neither segments nor windows."""
 
     def rates(place, in_full):
         blocks = max(scope.bits // size // (1 if in_full else 20), 1)
@@ -115,7 +115,7 @@ def undivided_rates(programs, scope, size, algorithm, iterations):
 
 
 class Simulation(NamedTuple):
-    """One of the two simulations: its results are the points around the rate."""
+    """One of the two simulations; its results are the points around the rate."""
     rates: Callable
     scope: Scope
     columns: tuple[str, ...]
@@ -163,7 +163,8 @@ def needed_by_units(results):
 
 
 def costs_of_division(results):
-    """How many dB the hardware with 2 units needs more than the undivided decoder, by size, algorithm and iterations."""
+    """The dB that the hardware with 2 units needs more than the undivided decoder, by size, algorithm and
+    iterations."""
     units = needed_by_units(results)
     return {key: units[*key, "2"] - value for key, value in needed(results / "undivided.csv").items()}
 
@@ -173,7 +174,7 @@ def decibels_of(estimates):
 
 
 def needed_table(results):
-    """The rows of the table: what 2 units need, and what 4 and 8 need more."""
+    """The rows of the table: Eb/N0 for 2 units, and the additional dB for 4 and 8."""
     found = needed_by_units(results)
     for size in UNITS_SCOPE.sizes:
         for algorithm in TYPES:

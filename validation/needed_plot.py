@@ -5,12 +5,12 @@ import subprocess
 
 TYPES = ("max-log", "scaled", "table")
 TITLES = {"max-log": "max-log (type 0)", "scaled": "scaled (type 1)", "table": "table (type 2)"}
-# What tells curves apart: colour and marker.
+# Colour and marker of each curve.
 LOOKS = (("#1f5f99", 7), ("#b5541c", 5), ("#3a8a3a", 9), ("#7a3a8a", 13))
 
 
 def curve(points, look, dash, title):
-    """A curve as gnuplot takes it: the element of `plot`, and the data that follows."""
+    """A curve in gnuplot's format: the element of `plot`, and its data."""
     colour, marker = look
     data = "".join(f"{x} {y:.4f}\n" for x, y in points) + "e\n"
     name = f'title "{title}"' if title else "notitle"
@@ -33,12 +33,12 @@ def picture(height, rows, panels):
 
 
 def limits(values, step):
-    """The whole steps between which all values lie."""
+    """The integer multiples of the step that enclose all values."""
     return step * (min(values) // step), step * -(-max(values) // step)
 
 
 def draw_units(needed):
-    """Above, what 2 units need; below, what 4 and 8 need beyond that. `needed` has dB by size, type, iterations, units."""
+    """Top: Eb/N0 for 2 units; bottom: additional dB for 4 and 8. `needed` has dB by size, type, iterations, units."""
     sizes = sorted({key[0] for key in needed})
     iterations = sorted({key[2] for key in needed}, reverse=True)
     ticks = ", ".join(f'"{size}" {size}' for size in sizes if size not in (104, 1504, 3072, 4096))
@@ -69,7 +69,7 @@ def draw_units(needed):
 
 
 def draw_undivided(costs):
-    """What segments and windows cost over the iterations. `costs` has dB by size, type, iterations."""
+    """The cost of segments and windows over the iterations. `costs` has dB by size, type, iterations."""
     sizes = sorted({key[0] for key in costs})
     iterations = sorted({key[2] for key in costs})
     highest = limits(costs.values(), 0.1)[1]

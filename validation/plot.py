@@ -8,7 +8,7 @@ COLOURS = {"2": "#1f5f99", "4": "#b5541c", "8": "#3a8a3a"}
 
 
 def data_blocks(columns, rate):
-    """For each number of units: place, distance, and half of the 95 % interval."""
+    """For each number of units: position, distance, and half of the 95 % interval."""
     blocks = []
     for shift, units in zip((-0.22, 0, 0.22), COLOURS):
         lines = [f"{place + shift} {found[rate, units].db} {CONFIDENCE * found[rate, units].deviation}"

@@ -14,7 +14,7 @@ import subprocess
 import sys
 import tempfile
 
-sys.dont_write_bytecode = True  # the tree stays as it is
+sys.dont_write_bytecode = True  # writes no bytecode into the tree
 from distances import crossing, paired_step, read_curves, read_reference, read_rows
 from needed import ITERATIONS, SIMULATIONS, division_table, needed_table, pictures
 from plot import draw
@@ -30,7 +30,7 @@ UNITS = ("2", "4", "8")
 TYPES = ("max-log", "scaled", "table")
 KEPT = ("block_size", "num_pu", "algorithm", "scale", "iterations", "ebn0_db", "blocks", "block_errors")
 
-# Each at the Eb/N0 of the reference, so that straight lines between the points are wrong alike in both curves.
+# Each at the Eb/N0 of the reference, so that linear interpolation has the same error in both curves.
 SWEEP = ["ber", "--num-pu", "2,4,8", "--algorithm", "0,1,2", "--stop-bler", "0.01", "--threads", "1", "--quiet"]
 MODEL_RUNS = {
     "k40_i8": ["--block-size", "40", "--iterations", "8", "--ebn0", "0:0.5:5", "--block-errors", "4000"],
@@ -51,7 +51,7 @@ VARIANT_RUNS = {
 }
 ALL_RUNS = [*MODEL_RUNS, *VARIANT_RUNS, *SIMULATIONS]
 
-# Results, the reference with the same number of iterations, how the document calls it, and the types compared with it.
+# Results, the reference with the same number of iterations, its name in the document, and the types compared with it.
 COMPARISONS = (
     ("k40_i8", "local_aff3ct302_k40_i8_maxlog075.csv", "scaled", TYPES),
     ("k512_i8", "local_aff3ct302_k512_i8_maxlog.csv", "max-log", TYPES[:1]),
@@ -60,7 +60,7 @@ COMPARISONS = (
     ("k6144_i6", "aff3ct_lte_k6144_i6_float32.csv", "scaled", TYPES),
     ("k6144_i6", "aff3ct_lte_k6144_i6_q16_6b3f.csv", "scaled, 6 bits", TYPES),
 )
-# References with the algorithm of the fine decoder of these simulations.
+# References with the algorithm of the fine decoder, by simulation.
 LIKE_FINE = {
     "variants_k40_type1": "local_aff3ct302_k40_i8_maxlog075.csv",
     "variants_k512_type0": "local_aff3ct302_k512_i8_maxlog.csv",
@@ -72,7 +72,7 @@ STEPS = (("clipped", "fine"), ("undivided", "clipped"), ("windows", "undivided")
 
 
 def simulate(programs, name):
-    """Runs a simulation and keeps its results: of the model those columns that do not depend on the machine."""
+    """Runs a simulation and keeps its results; of the model, only the columns that do not depend on the machine."""
     print(f"{name} ...", file=sys.stderr, flush=True)
     target = RESULTS / f"{name}.csv"
     if name in VARIANT_RUNS:
@@ -89,7 +89,7 @@ def simulate(programs, name):
 
 
 def table(header, rows, texts):
-    """Of the columns, so many hold text, the others numbers."""
+    """The first columns hold text, the others numbers."""
     lines = [header, ["---"] * texts + ["--:"] * (len(header) - texts), *rows]
     return "".join("| " + " | ".join(line) + " |\n" for line in lines)
 
@@ -99,7 +99,7 @@ def shown(estimate):
 
 
 def distances():
-    """For each comparison and type: the distances by rate and number of units."""
+    """For each comparison and type: the distances, by rate and number of units."""
     for results, reference, kind, types in COMPARISONS:
         curves = read_curves(RESULTS / f"{results}.csv", "algorithm", "num_pu")
         right_of = {rate: crossing(read_reference(REFERENCES / reference), rate) for rate in RATES}
@@ -110,7 +110,7 @@ def distances():
 
 
 def parts_of(results):
-    """The block size and the iterations in the name of results."""
+    """The block size and the iterations, parsed from the name of results."""
     return re.fullmatch(r"k(\d+)_i(\d+)", results).groups()
 
 
@@ -133,7 +133,7 @@ def reference_table():
 
 
 def steps_at(name, rate):
-    """How far the fine decoder is from the reference where there is one, and what each step from there costs."""
+    """The distance of the fine decoder from the reference, if there is one, and the cost of each step from there."""
     path = RESULTS / f"{name}.csv"
     curves = {key[0]: points for key, points in read_curves(path, "variant").items()}
     differing = {}
@@ -147,7 +147,7 @@ def steps_at(name, rate):
 
 
 def step_table():
-    """What each step from the reference to the hardware costs, where the points of the simulations reach."""
+    """The cost of each step from the reference to the hardware, where the simulated points suffice."""
     rows = []
     for name in VARIANT_RUNS:
         size, algorithm = re.fullmatch(r"variants_k(\d+)_type(\d)", name).groups()
@@ -160,7 +160,7 @@ def step_table():
 
 
 def with_tables(text):
-    """The document with its tables anew: each stands between two comments with its name."""
+    """The document with updated tables, each between two comments with its name."""
     by_iterations = ["K", "type", *map(str, sorted(ITERATIONS))]
     for name, content in (("references", reference_table()), ("distances", distance_table()), ("steps", step_table()),
                           ("units", table(by_iterations, needed_table(RESULTS), 2)),

@@ -1,6 +1,5 @@
-// morvik_variants: block error rates while the model's arithmetic changes, step by step, from a fine and undivided
-// decoder into the hardware's. All variants decode the same received values, so that their difference is far more exact
-// than each of them.
+// morvik_variants: BLER of decoders that lead, step by step, from fine, undivided arithmetic to the hardware's. All
+// variants decode the same received values, so their differences are far more exact than each rate.
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
@@ -25,13 +24,13 @@ namespace {
 
 using namespace morvik::link;
 
-/// A decoder on the way to the hardware's. Fraction bits more than three divide a step of the soft values.
+/// A decoder between the reference and the hardware. More than three fraction bits divide the step of the soft values.
 struct Variant {
     const char* name;
-    std::size_t predecessor;  ///< the variant from which it is one step
+    std::size_t predecessor;  ///< the variant that differs by one step
     const char* stateFormat;
     const char* branchFormat;
-    const char* decoder;  ///< properties; empty: neither segments nor windows
+    const char* decoder;  ///< property string; empty: neither segments nor windows
 };
 
 /// The limit of the branch metrics is 64 in `fine`, 16 in all others. `hardware_N` is the model with N units.
@@ -45,7 +44,7 @@ constexpr std::array<Variant, 7> variants = {{
     {"hardware_8", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:8"},
 }};
 
-/// Passes on what a factory made.
+/// Returns what a factory made; throws on failure.
 template <class Component>
 std::unique_ptr<Component> made(Component* component)
 {
@@ -74,8 +73,8 @@ public:
         itsDecoder->itsExtrinsicScale = algorithm == 1 ? 0.75 : 1.0;
     }
 
-    /// Whether the block that was received, in units of the sent amplitude, decodes without an error. `scale` counts
-    /// steps of the hardware's soft values, eighths.
+    /// Whether the received block, in units of the transmitted amplitude, decodes without an error. `scale` is in steps
+    /// of the hardware's soft values, eighths.
     bool decodes(const std::vector<double>& received,
                  double scale,
                  unsigned iterations,
@@ -105,7 +104,7 @@ private:
     std::vector<unsigned char> itsHard;
 };
 
-/// Blocks of random bits as they are received, those of seed 1.
+/// Received blocks of random bits, from seed 1.
 class ReceivedBlocks {
 public:
     ReceivedBlocks(unsigned K, int milliDecibels)
@@ -156,7 +155,7 @@ struct Options {
     std::vector<std::string> variants;  ///< names; if empty, all
 };
 
-/// Whether a variant takes part: the correction table is for three fraction bits alone.
+/// Whether a variant takes part: the correction table only works with three fraction bits.
 bool isSimulated(const Variant& variant, const Options& options)
 {
     const bool hasTable = std::string(variant.stateFormat) == "Fix_12_3";
@@ -187,7 +186,7 @@ std::vector<std::size_t> simulatedVariants(const Options& options)
     return simulated;
 }
 
-/// For each of the variants, the place of the nearest one before it on the way that takes part, or its own.
+/// For each variant, the index of the nearest participating one before it, or its own.
 std::vector<std::size_t> predecessorsOf(const std::vector<std::size_t>& simulated)
 {
     std::vector<std::size_t> places;
@@ -204,7 +203,7 @@ std::vector<std::size_t> predecessorsOf(const std::vector<std::size_t>& simulate
 }
 
 /// Decodes the blocks of a point until the first variant, the best one, has failed often enough. A disagreement is a
-/// block of which a variant and its predecessor decode but one.
+/// block that exactly one of a variant and its predecessor decodes.
 void simulatePoint(const Options& options, int milliDecibels)
 {
     const std::vector<std::size_t> simulated = simulatedVariants(options);
