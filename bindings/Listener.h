@@ -1,4 +1,4 @@
-// Listener: what the library writes on the standard streams, collected.
+// Listener: captures what the library writes on the standard streams.
 #ifndef MORVIK_BINDINGS_LISTENER_H
 #define MORVIK_BINDINGS_LISTENER_H
 
@@ -8,7 +8,7 @@
 
 namespace morvik {
 
-/// Collects while it lives. The streams are process-wide: one at a time.
+/// Captures during its lifetime. The streams are process-wide: one at a time.
 class Listener {
 public:
     Listener() : itsOutput(std::cout.rdbuf(&itsText)), itsError(std::cerr.rdbuf(&itsText)) {}

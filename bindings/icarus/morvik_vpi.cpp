@@ -22,14 +22,14 @@ namespace {
 
 using morvik::simulator::Session;
 
-/// A system task or function: its name, and what its arguments are, a letter each: i an integer, a an array of soft
-/// values, d an array of decisions.
+/// A system task or function: its name, and one letter per argument: i an integer, a an array of soft values, d an
+/// array of decisions.
 struct Call {
     const char* name;
     const char* arguments;
 };
 
-/// What is wrong with the arguments of a call.
+/// An error in the arguments of a call.
 struct Mistake : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
@@ -40,13 +40,13 @@ std::map<int, std::unique_ptr<Session>>& sessions()
     return all;
 }
 
-// The interface takes texts that are not constant, and does not change them.
+// The interface takes non-const strings, but does not change them.
 char* text(const char* constant)
 {
     return const_cast<char*>(constant);
 }
 
-/// In the form of the simulator's own errors.
+/// In the format of the simulator's own errors.
 void report(const char* severity, const std::string& line)
 {
     vpiHandle call = vpi_handle(vpiSysTfCall, nullptr);
@@ -76,7 +76,7 @@ std::vector<vpiHandle> argumentsOf(vpiHandle call)
     return all;
 }
 
-/// A value, extended by its sign where it is narrower than 32 bits and `isSigned`. What is wider has to fit in them.
+/// A value, sign-extended if `isSigned` and narrower than 32 bits. A wider one must fit into 32 bits.
 int valueOf(vpiHandle object, bool isSigned, const std::string& name)
 {
     const int width = vpi_get(vpiSize, object);
@@ -123,7 +123,7 @@ Session& sessionOf(vpiHandle object)
     return *place->second;
 }
 
-/// The first element of an array that has at least `count`.
+/// The first element of an array with at least `count` elements.
 int firstIndex(vpiHandle array, int count)
 {
     const int words = vpi_get(vpiSize, array);
@@ -140,7 +140,7 @@ int firstIndex(vpiHandle array, int count)
     return left.value.integer < right.value.integer ? left.value.integer : right.value.integer;
 }
 
-/// A soft value. The simulator does not tell whether an array is signed; soft values always are.
+/// A soft value. The simulator does not say whether an array is signed; soft values always are.
 int element(vpiHandle array, int index)
 {
     return valueOf(vpi_handle_by_index(array, index),
@@ -190,7 +190,7 @@ int decode(const std::vector<vpiHandle>& arguments)
     const int firstDecision = firstIndex(arguments[7], size > 4 ? size - 4 : 0);
     const int iterations = argument(arguments[5], "The number of iterations");
     const auto tag = static_cast<std::uint32_t>(argument(arguments[6], "The tag"));
-    // Last: what has been put belongs to the next block, whatever call decodes it.
+    // Last: positions that were put belong to the next block, whatever call decodes it.
     putStreams(session, {arguments[1], arguments[2], arguments[3]}, size);
     const int status = session.decode(iterations, tag);
     reportMessages(session);
@@ -225,7 +225,7 @@ bool isArray(vpiHandle object)
     return type == vpiMemory || type == vpiNetArray;
 }
 
-/// Real numbers and texts have no bits that could be asked for.
+/// Reals and strings have no bits to ask for.
 bool isInteger(vpiHandle object)
 {
     const int type = vpi_get(vpiType, object);
@@ -236,7 +236,7 @@ bool isInteger(vpiHandle object)
     return type != vpiRealVar && type != vpiStringVar;
 }
 
-/// Elements of an array of real numbers appear to have one bit, as those of hard bits.
+/// Elements of an array of reals appear to have one bit, like those of hard bits.
 void checkSoftValues(vpiHandle array, const std::string& name)
 {
     const int width = vpi_get(vpiSize, vpi_handle_by_index(array, firstIndex(array, 1)));
@@ -263,7 +263,7 @@ void checkArgument(vpiHandle object, char kind, std::size_t number)
     }
 }
 
-/// When the design is compiled: the number and the kinds of the arguments.
+/// At compile time of the design: checks the number and the kinds of the arguments.
 PLI_INT32 check(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): the interface's type
 {
     const auto& call = *reinterpret_cast<const Call*>(data);
@@ -285,7 +285,7 @@ PLI_INT32 check(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): th
     return 0;
 }
 
-/// Calls a function with its arguments; a mistake becomes a line in the log, and `failed`.
+/// Calls a function with its arguments; an error becomes a line in the log, and `failed`.
 template <int (*function)(const std::vector<vpiHandle>&), int failed, bool returns>
 PLI_INT32 run(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): the interface's type
 {
@@ -325,6 +325,6 @@ void announceAll()
 }  // namespace
 
 extern "C" {
-/// The simulator calls these when it has loaded the module.
+/// The simulator calls these after loading the module.
 MORVIK_API void (*vlog_startup_routines[])() = {announceAll, nullptr};
 }

@@ -53,7 +53,7 @@ function [bits, ratios, tags] = morvik_decode(sys, par1, par2, varargin)
     end
 end
 
-% The streams as columns of one of the classes that the library takes.
+% The streams as columns of a class that the library takes.
 function [sys, par1, par2, is_row] = streams(sys, par1, par2)
     same_size(sys, par1, par2);
     is_row = size(sys, 1) == 1;
@@ -96,7 +96,7 @@ function values = whole(name, values)
         error('morvik:badClass', ['morvik_decode: %s is of class %s, which has no negative values; soft values are ' ...
             'negative for bit 0'], name, class(values));
     end
-    % Within 24 bits, which are what the hardware looks at.
+    % Within 24 bits, the range that the hardware reads.
     if any(values(:) ~= fix(values(:))) || any(values(:) < -2^23) || any(values(:) >= 2^23)
         error('morvik:badValue', ['morvik_decode: %s has to hold whole numbers from -2^23 to 2^23 - 1, ' ...
             'as round(8 * received) gives for bits sent as -1 and 1'], name);
@@ -150,7 +150,7 @@ function value = read_option(name, value, blocks)
 end
 
 function index = one_of(name, value, values)
-    if isa(value, 'string')  % MATLAB has two kinds of text
+    if isa(value, 'string')  % MATLAB has two string classes
         value = char(value);
     end
     if ~ischar(value)

@@ -13,7 +13,7 @@ ROOT = Path(__file__).resolve().parents[2]
 
 
 class CMakeBuild(build_ext):
-    """Lets CMake compile the library and the module, in a folder of the build."""
+    """Lets CMake compile the library and the module, in a build folder."""
 
     def build_extension(self, ext: Extension) -> None:
         package = Path(self.get_ext_fullpath(ext.name)).resolve().parent

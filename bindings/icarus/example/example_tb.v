@@ -9,7 +9,7 @@ module example_tb;
     integer model, num_pu, algorithm, width, status, blocks, bits, wrong_bits, read, K, i;
     reg device;
 
-    // Words of the set, which docs/vectors.md lays out.
+    // Words of the set; docs/vectors.md describes their layout.
     reg [147:0] block;
     reg [23:0] position;
 
@@ -25,7 +25,7 @@ module example_tb;
         end
     endtask
 
-    // The core that the set is for stands in its manifest, a parameter in each line.
+    // The manifest has the core's configuration, one parameter per line.
     task read_manifest;
         integer file;
         begin
@@ -47,7 +47,7 @@ module example_tb;
         end
     endtask
 
-    // Opens the words of a table, behind the comment with their layout.
+    // Opens a table's words and skips the layout comment.
     task open_words(input [8 * 16 - 1:0] table_name, output integer file);
         begin
             $sformat(name, "%0s/%0s.memh", set, table_name);

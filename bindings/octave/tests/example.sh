@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# The example prints error rates that fall, and draws a curve for each algorithm.
+# The example prints falling error rates and draws a curve for each algorithm.
 #   example.sh FUNCTIONS FILE.svg
 set -euo pipefail
 rm -f "$2"

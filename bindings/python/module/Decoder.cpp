@@ -1,4 +1,4 @@
-// Decoder: decodes batches on several threads, with a state of the C interface for each.
+// Decoder: decodes batches on several threads, each with its own state of the C interface.
 #include "Decoder.h"
 
 #include <algorithm>
@@ -34,7 +34,7 @@ Outcome decodeOn(veltra_ip_morvik_v1_0_state* state, const Batch<Input>& batch)
     outputs.ratios_alloc = outputs.dout_alloc;
     outputs.tags = batch.keptTags;
     outputs.tags_alloc = batch.blocks;
-    takeMessages();  // of a call that ended with an exception
+    takeMessages();  // left from a call that ended with an exception
     const auto& [sys, par1, par2] = batch.streams;
     Outcome outcome;
     outcome.status =
@@ -43,13 +43,13 @@ Outcome decodeOn(veltra_ip_morvik_v1_0_state* state, const Batch<Input>& batch)
     return outcome;
 }
 
-/// Where to cut a batch: 0, then the ends of the threads' parts.
+/// How to split a batch: 0, then the ends of the threads' parts.
 template <class Input>
 std::vector<std::uint32_t> cuts(const Batch<Input>& batch, unsigned threads)
 {
-    // Some tenths of a millisecond of work: long beside what starting a thread takes.
+    // A few tenths of a millisecond of work: long compared with starting a thread.
     constexpr std::uint64_t leastBitIterations = std::uint64_t{1} << 18;
-    // The lanes take several blocks at once.
+    // The lanes decode several blocks at once.
     constexpr std::uint64_t together = 32;
     const std::uint64_t blocks = batch.blocks;
     const std::uint64_t useful = blocks * batch.blockSize() * batch.iterations / leastBitIterations;
@@ -63,7 +63,7 @@ std::vector<std::uint32_t> cuts(const Batch<Input>& batch, unsigned threads)
     return ends;
 }
 
-/// "WARNING ... in position 7 ..., further saturation will not be reported": all but the end may differ.
+/// "WARNING ... in position 7 ..., further saturation will not be reported": only the end is the same each time.
 std::string kindOf(const std::string& warning)
 {
     return warning.substr(std::min(warning.rfind(','), warning.size()));
@@ -105,7 +105,7 @@ Outcome Decoder::decode(const Batch<Input>& batch, unsigned threads)
     while (itsStates.size() < parts) {
         itsStates.push_back(makeState());
     }
-    // Where no further thread can be started, a part waits for get() and is decoded there.
+    // If no further thread can be started, get() decodes the part.
     std::vector<std::future<Outcome>> others;
     for (std::size_t i = 1; i < parts; ++i) {
         others.push_back(std::async(std::launch::async | std::launch::deferred,
@@ -158,7 +158,7 @@ void Decoder::expectOpen() const
     }
 }
 
-/// Adds what came of the next part. Its state may warn of what another state has warned of before.
+/// Adds the result of the next part. Its state may repeat warnings of another state.
 void Decoder::add(Outcome part, Outcome& whole)
 {
     for (std::string& warning : part.messages.warnings) {

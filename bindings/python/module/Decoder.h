@@ -1,4 +1,4 @@
-// Decoder: decodes batches on several threads, with a state of the C interface for each.
+// Decoder: decodes batches on several threads, each with its own state of the C interface.
 #ifndef MORVIK_BINDINGS_PYTHON_MODULE_DECODER_H
 #define MORVIK_BINDINGS_PYTHON_MODULE_DECODER_H
 
@@ -16,13 +16,13 @@
 
 namespace morvik::python {
 
-/// What the library refuses, with its text.
+/// A refusal by the library, with its text.
 class Refusal : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
 };
 
-/// Blocks of one size, block after block, and where their results go.
+/// Consecutive blocks of one size, and where their results go.
 template <class Input>
 struct Batch {
     std::array<const Input*, 3> streams;  ///< systematic, parity 1, parity 2
@@ -34,7 +34,7 @@ struct Batch {
     std::int16_t* ratios = nullptr;  ///< or null
     std::uint32_t* keptTags = nullptr;
 
-    /// The blocks from `first` up to, but without, `last`.
+    /// The blocks `first` to `last` - 1.
     Batch part(std::uint32_t first, std::uint32_t last) const;
 
     std::size_t blockSize() const
@@ -43,27 +43,27 @@ struct Batch {
     }
 };
 
-/// How a call of the C interface ended, and what it had to say.
+/// Status and messages of a call of the C interface.
 struct Outcome {
     std::int32_t status = 0;
     Messages messages;
 };
 
-/// May be used by several threads, which then take turns.
+/// Thread-safe; concurrent calls take turns.
 class Decoder {
 public:
-    /// An empty instruction set leaves the choice to the library. Throws Refusal.
+    /// With an empty instruction set, the library chooses. Throws Refusal.
     Decoder(std::int32_t numPu, std::int32_t algorithm, std::int32_t tagWidth, std::string instructionSet);
 
-    /// Decodes a batch on up to so many threads. Results and warnings are those of one state that decodes all blocks
-    /// in their order. Throws Refusal when closed.
+    /// Decodes a batch on at most the given number of threads. Results and warnings are those of one state that decodes
+    /// all blocks in order. Throws Refusal when closed.
     template <class Input>
     Outcome decode(const Batch<Input>& batch, unsigned threads);
 
     /// The name of the instruction set in use. Throws Refusal when closed.
     std::string instructionSet();
 
-    /// Releases the states, once nobody decodes any more.
+    /// Releases the states when no call is decoding any more.
     void close();
 
     bool isClosed();
@@ -83,9 +83,9 @@ private:
 
     veltra_ip_morvik_v1_0_generics itsGenerics;
     std::string itsInstructionSet;
-    std::mutex itsMutex;              // of all that follows
+    std::mutex itsMutex;              // guards everything below
     std::vector<State> itsStates;     // one for each thread; none when closed
-    std::set<std::string> itsWarned;  // kinds of warnings, each of which comes once
+    std::set<std::string> itsWarned;  // kinds of warnings already given; each comes once
 };
 
 }  // namespace morvik::python

@@ -1,4 +1,4 @@
-// ErrorRates: simulations of error rates in this process, on threads.
+// ErrorRates: error rate simulations in this process, on threads.
 #include "ErrorRates.h"
 
 #include "simulation/Run.h"
@@ -8,7 +8,7 @@ namespace morvik::python {
 
 namespace {
 
-/// Hands on the rows of points that end.
+/// Passes on the rows of completed points.
 class EndedPoints : public simulation::Progress {
 public:
     EndedPoints(const simulation::Plan& plan, const Listeners& listeners) : itsPlan(plan), itsListeners(listeners) {}

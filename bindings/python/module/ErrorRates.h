@@ -1,4 +1,4 @@
-// ErrorRates: simulations of error rates in this process, on threads.
+// ErrorRates: error rate simulations in this process, on threads.
 #ifndef MORVIK_BINDINGS_PYTHON_MODULE_ERRORRATES_H
 #define MORVIK_BINDINGS_PYTHON_MODULE_ERRORRATES_H
 
@@ -10,13 +10,13 @@
 
 namespace morvik::python {
 
-/// Who hears of a simulation, in the thread that runs it. What they throw ends it.
+/// Callbacks in the thread that runs the simulation. An exception from one ends it.
 struct Listeners {
     std::function<void()> isRunning;                                          ///< several times a second
     std::function<void(const std::vector<simulation::ResultRow>&)> hasEnded;  ///< the rows of a point
 };
 
-/// The rows of all points. An empty instruction set leaves the choice to the decoder.
+/// The rows of all points. With an empty instruction set, the decoder chooses.
 std::vector<simulation::ResultRow> errorRates(const simulation::Plan& plan,
                                               unsigned threads,
                                               const std::string& instructionSet,

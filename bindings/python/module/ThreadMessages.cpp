@@ -1,4 +1,4 @@
-// ThreadMessages: what the library has to say, kept for the caller instead of written to the process's streams.
+// ThreadMessages: the library's messages, kept for the caller instead of written to the process's streams.
 #include "ThreadMessages.h"
 
 #include <sstream>

@@ -1,7 +1,7 @@
-// ThreadMessages: what the library has to say, kept for the caller instead of written to the process's streams.
+// ThreadMessages: the library's messages, kept for the caller instead of written to the process's streams.
 //
-// The module is linked from the library's objects, with this unit in the place of src/MessageStreams.cpp. Each thread
-// has streams of its own, so that a message always belongs to the call that caused it.
+// The module is linked from the library's objects, with this unit in place of src/MessageStreams.cpp. Each thread has
+// its own streams, so a message always belongs to the call that caused it.
 #ifndef MORVIK_BINDINGS_PYTHON_MODULE_THREADMESSAGES_H
 #define MORVIK_BINDINGS_PYTHON_MODULE_THREADMESSAGES_H
 
@@ -10,13 +10,13 @@
 
 namespace morvik::python {
 
-/// Messages of one thread, without what the library puts before the text: "ERROR:decoder:".
+/// Messages of one thread, without the library's prefix: "ERROR:decoder:".
 struct Messages {
     std::string error;  ///< the first one, or empty
     std::vector<std::string> warnings;
 };
 
-/// What has been said in this thread since the last call.
+/// The messages of this thread since the last call.
 Messages takeMessages();
 
 }  // namespace morvik::python

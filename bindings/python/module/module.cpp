@@ -1,5 +1,5 @@
-// module: the extension `morvik._core`, which the package `morvik` is written on. It trusts the package's checks of
-// numbers and shapes.
+// module: the extension `morvik._core`, the base of the package `morvik`. It relies on the package's checks of numbers
+// and shapes.
 #include <pybind11/functional.h>
 #include <pybind11/numpy.h>
 #include <pybind11/pybind11.h>
@@ -33,9 +33,9 @@ std::size_t sizeOf(py::ssize_t extent)
     return static_cast<std::size_t>(extent);
 }
 
-/// Gives the interpreter's lock away while it lives. Where the interpreter has ended meanwhile, because this is a
-/// daemon thread, to ask for the lock unwinds the thread, past owners of objects that must not be touched any more. It
-/// rests instead, until the process ends.
+/// Releases the interpreter lock during its lifetime. If the interpreter has ended meanwhile, because this is a daemon
+/// thread, asking for the lock would unwind the thread, through owners of objects that must no longer be touched.
+/// Instead, the thread sleeps until the process ends.
 class Unlocked {
 public:
     Unlocked() : itsThread(PyEval_SaveThread()) {}
@@ -127,14 +127,14 @@ void addDecoder(py::module_& module)
     addDecode<std::int8_t>(decoder);
     addDecode<std::int16_t>(decoder);
     addDecode<std::int32_t>(decoder);
-    // Each of these may have to wait for a thread that decodes.
+    // Each of these may wait for a decoding thread.
     const py::call_guard<Unlocked> unlocked;
     decoder.def("close", &Decoder::close, unlocked);
     decoder.def_property_readonly("closed", py::cpp_function(&Decoder::isClosed, unlocked));
     decoder.def_property_readonly("instruction_set", py::cpp_function(&Decoder::instructionSet, unlocked));
 }
 
-// ---- What stands around a decoder
+// ---- Encoder, interleaver and channel
 
 Array<std::int64_t> interleaver(unsigned K)
 {
@@ -220,7 +220,7 @@ void addLink(py::module_& module)
 
 // ---- Simulation
 
-/// Named as the columns of result files.
+/// Named like the columns of result files.
 py::dict fields(const morvik::simulation::ResultRow& row)
 {
     const morvik::simulation::Bounds bits = morvik::simulation::bitErrorBounds(row);
@@ -263,7 +263,7 @@ py::list fieldsOf(const std::vector<morvik::simulation::ResultRow>& rows)
     return list;
 }
 
-/// Ctrl-C and the other signals of Python end a simulation by their exceptions.
+/// Ctrl-C and Python's other signals end a simulation through their exceptions.
 Listeners listenersOf(const py::object& progress)
 {
     Listeners listeners;
@@ -331,8 +331,8 @@ void addSimulation(py::module_& module)
                py::arg("progress"));
 }
 
-/// Whether the interpreter is the process's first one; else an ImportError is set. In another one, pybind11 would wait
-/// for the lock that its own thread holds.
+/// Whether the interpreter is the main one of the process; if not, an ImportError is set. In another one, pybind11
+/// would wait for the lock that its own thread holds.
 bool isMainInterpreter()
 {
     if (PyInterpreterState_Get() == PyInterpreterState_Main()) {
@@ -342,7 +342,7 @@ bool isMainInterpreter()
     return false;
 }
 
-/// For a module that another interpreter has loaded before. A plain function: one of pybind11 would wait as well.
+/// For a module that another interpreter has already loaded. A plain function: one of pybind11 would wait as well.
 PyObject* expectMainInterpreter(PyObject*, PyObject*)
 {
     if (!isMainInterpreter()) {
@@ -355,7 +355,7 @@ PyMethodDef plainFunctions[] = {{"expect_main_interpreter", expectMainInterprete
 
 }  // namespace
 
-// What pybind11 defines stands behind a check, since it waits before it begins with the module.
+// pybind11's own entry point runs after a check, since it waits before it initialises the module.
 #define PyInit__core initialiseCore
 PYBIND11_MODULE(_core, module)
 {

@@ -14,7 +14,7 @@ docs/python.md tells the rest.
 
 from morvik import _core
 
-_core.expect_main_interpreter()  # a module that is loaded already is not asked again by the import
+_core.expect_main_interpreter()  # an import does not check this again for a module that is already loaded
 
 from morvik._core import __version__
 from morvik._decoder import Decoded, Decoder

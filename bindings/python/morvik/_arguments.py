@@ -1,4 +1,4 @@
-"""Checks of arguments: every message names the argument, what was given and what is allowed."""
+"""Argument checks: every message names the argument, what was given and what is allowed."""
 
 from __future__ import annotations
 
@@ -21,7 +21,7 @@ DEFAULT_NUM_PU = _core.default_num_pu
 DEFAULT_ALGORITHM = list(ALGORITHMS)[_core.default_algorithm]
 DEFAULT_TAG_WIDTH = _core.default_tag_width
 DEFAULT_ITERATIONS = 8
-TAIL = 4  # positions of a block behind its K others
+TAIL = 4  # extra positions of a block after its K
 _SIZES = frozenset(_core.block_sizes)
 
 
@@ -34,7 +34,7 @@ def integer(name: str, value: Any, low: int, high: int) -> int:
 
 
 def any_integer(name: str, value: Any) -> int:
-    """The value as an int; a truth value is none."""
+    """The value as an int; booleans are refused."""
     try:
         if isinstance(value, bool):
             raise TypeError
@@ -44,13 +44,13 @@ def any_integer(name: str, value: Any) -> int:
 
 
 def word(name: str, value: Any, low: int, high: int) -> int:
-    """The value as an int that a word of the C interface holds. One beyond becomes an end of the range, which is as
-    bad: the decoder is to say what it allows."""
+    """The value as an int that fits a word of the C interface. A value beyond it becomes the nearest end of the
+    range, which the decoder refuses as well: it says what it allows."""
     return min(max(any_integer(name, value), low), high)
 
 
 def algorithm_number(algorithm: str | int) -> int:
-    """The number of an algorithm; whether there is such a number is for the decoder to say."""
+    """The number of an algorithm; the decoder checks whether it exists."""
     if not isinstance(algorithm, str):
         return word("algorithm", algorithm, -1, 3)
     if algorithm not in ALGORITHMS:
@@ -67,7 +67,7 @@ def block_size(value: Any) -> int:
 
 
 def expect_block(name: str, positions: int) -> None:
-    """Refuses rows that are no block of soft values."""
+    """Refuses rows that are not a block of soft values."""
     if positions - TAIL in _SIZES:
         return
     size = positions - TAIL
@@ -88,7 +88,7 @@ def _nearest(size: int) -> str:
 
 
 def thousandths(name: str, value: Any, low: float, high: float) -> int:
-    """A decimal number within the bounds, with at most three places, times 1000."""
+    """A decimal number within the bounds, with at most three decimals, times 1000."""
     number = real(name, value)
     rounded = round(number * 1000) if low <= number <= high else None
     if rounded is None or abs(number * 1000 - rounded) > 1e-6 * max(1.0, abs(rounded)):
@@ -97,7 +97,7 @@ def thousandths(name: str, value: Any, low: float, high: float) -> int:
 
 
 def real(name: str, value: Any) -> float:
-    """The value as a finite float. A text, a truth value and a complex number are none, though Python converts them."""
+    """The value as a finite float. Strings, booleans and complex numbers are refused, though Python converts them."""
     expect_unmasked(name, value)
     kind = getattr(getattr(value, "dtype", None), "kind", "f")
     try:
@@ -122,7 +122,7 @@ def ebn0_thousandths(value: Any) -> int:
 
 
 def expect_unmasked(name: str, values: Any) -> None:
-    """Refuses masked arrays, alone or in a list: what is masked would count like the rest."""
+    """Refuses masked arrays, alone or in a list: masked elements would count like the others."""
     listed = values if isinstance(values, (list, tuple)) else ()
     if any(isinstance(value, np.ma.MaskedArray) for value in (values, *listed)):
         raise TypeError(f"{name} must not be a masked array, whose mask would be lost; take its .compressed() or .filled()")
@@ -135,7 +135,7 @@ def plain_array(name: str, values: npt.ArrayLike) -> npt.NDArray[Any]:
 
 
 def each(name: str, values: Any, check: Callable[[Any], Value]) -> list[Value]:
-    """Checks a single value, or each one of several, and lists them without those that come again."""
+    """Checks a single value or each of several, and returns a list without duplicates."""
     expect_unmasked(name, values)
     if isinstance(values, Iterable) and not isinstance(values, (str, bytes)) and getattr(values, "ndim", 1) > 0:
         several = list(dict.fromkeys(check(value) for value in values))
@@ -146,5 +146,5 @@ def each(name: str, values: Any, check: Callable[[Any], Value]) -> list[Value]:
 
 
 def thread_count(threads: int | None) -> int:
-    """As many threads as asked for, or as processors that this process may use."""
+    """The requested number of threads, or the number of processors that this process may use."""
     return len(os.sched_getaffinity(0)) if threads is None else integer("threads", threads, 1, 1024)

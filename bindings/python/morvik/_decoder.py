@@ -30,21 +30,21 @@ _OUT_OF_MEMORY = 99  # a status of the C interface
 
 
 class Decoded(NamedTuple):
-    """What :meth:`Decoder.decode` returns. ``n`` blocks have a leading dimension ``n`` that one block has not."""
+    """The result of :meth:`Decoder.decode`. For ``n`` blocks, arrays have a leading dimension ``n``."""
 
     bits: npt.NDArray[np.uint8]
     """Decisions, each 0 or 1: uint8 of shape (K,) or (n, K)."""
 
     tag: int | npt.NDArray[np.uint32]
-    """The tag, cut to ``tag_width`` bits: an int, or uint32 of shape (n,)."""
+    """The tag, truncated to ``tag_width`` bits: an int, or uint32 of shape (n,)."""
 
     llrs: npt.NDArray[np.int16] | None
-    """Log-likelihood ratios of the last pass, or None if they were not asked for: int16 of the shape of ``bits``.
-    128 steps make one; a ratio of 0 or more decides for bit 1. They wrap like the hardware's 12-bit metrics."""
+    """Log-likelihood ratios of the last half-iteration, or None if not requested: int16 of the shape of ``bits``.
+    128 steps per unit; a ratio of 0 or more decides for bit 1. They wrap like the hardware's 12-bit metrics."""
 
 
 class Decoder:
-    """A turbo decoder, bit by bit the hardware core with these generics.
+    """A turbo decoder, bit-accurate to the hardware core with these generics.
 
     ``num_pu``
         Parallel processing units: 2, 4 or 8. Like the next two, the library's default when it is not given: 2,
@@ -134,7 +134,7 @@ class Decoder:
         return Decoded(bits, kept, ratios)
 
     def close(self) -> None:
-        """Releases the decoder's memory, after which it decodes no more. Closing it again does nothing."""
+        """Releases the decoder's memory; it cannot decode afterwards. Closing it again does nothing."""
         self._core.close()
 
     @property
@@ -159,7 +159,7 @@ class Decoder:
 
     @property
     def threads(self) -> int:
-        """How many threads a call uses at most."""
+        """The maximum number of threads of a call."""
         return self._threads
 
     @property
@@ -184,7 +184,7 @@ class Decoder:
 
 
 def _streams(*values: npt.ArrayLike) -> list[npt.NDArray[Any]]:
-    """The three streams, of one shape and one type."""
+    """The three streams, with a common shape and type."""
     names = ("sys", "par1", "par2")
     arrays = [_soft_values(name, value) for name, value in zip(names, values)]
     for name, array in zip(names[1:], arrays[1:]):

@@ -1,4 +1,4 @@
-"""What goes wrong, as Python sees it."""
+"""Errors and warnings in Python."""
 
 from morvik._core import Error as Error
 
@@ -7,6 +7,6 @@ Error.__doc__ = """The decoder refuses something, for the reason that the text g
 
 
 class DecoderWarning(UserWarning):
-    """A warning of the decoder, such as of the first soft value that was clipped. Each kind comes once in a
-    decoder's life; ``warnings.filterwarnings("error", category=morvik.DecoderWarning)`` makes it an exception.
+    """A warning of the decoder, such as for the first clipped soft value. Each kind comes once in a decoder's life;
+    ``warnings.filterwarnings("error", category=morvik.DecoderWarning)`` makes it an exception.
     """

@@ -1,4 +1,4 @@
-"""What stands before a decoder: encoder, interleaver and channel."""
+"""The transmit side: encoder, interleaver and channel."""
 
 from __future__ import annotations
 
@@ -71,7 +71,7 @@ def awgn(
     scale: float | None = None,
     rng: np.random.Generator | int | None = None,
 ) -> Streams:
-    """Sends encoded bits over BPSK and white Gaussian noise, and quantises what is received.
+    """Sends encoded bits over BPSK with white Gaussian noise, and quantises the received values.
 
     ``streams``
         What :func:`encode` returns.
@@ -102,7 +102,7 @@ def awgn(
     return Streams(*(_received(array, deviation, steps, generator) for array in arrays))
 
 
-_block_size = block_size  # under a name that no parameter has
+_block_size = block_size  # under a name that no parameter shadows
 
 
 def _received(

@@ -158,7 +158,7 @@ def error_rate(
 
 
 def _expect_decoders(num_pus: list[int], algorithms: list[int], instruction_set: str | None) -> None:
-    """Lets the decoder refuse what it does not know."""
+    """Lets the decoder refuse unknown values."""
     for num_pu in num_pus:
         for algorithm in algorithms:
             Decoder(num_pu, algorithm, threads=1, instruction_set=instruction_set).close()

@@ -1,4 +1,4 @@
-"""What the tests share."""
+"""Fixtures shared by the tests."""
 
 from pathlib import Path
 
@@ -16,7 +16,7 @@ def repository() -> Path:
 
 @pytest.fixture
 def soft() -> morvik.Streams:
-    """Noisy blocks of 40 bits, some of which keep wrong bits: int8 of shape (100, 44)."""
+    """Noisy blocks of 40 bits, some of which keep bit errors: int8 of shape (100, 44)."""
     rng = np.random.default_rng(1)
     return morvik.awgn(morvik.encode(rng.integers(0, 2, (100, 40))), 1.0, rng=rng)
 

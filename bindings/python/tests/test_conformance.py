@@ -1,4 +1,4 @@
-"""The decisions of the file that the tests of all bindings read."""
+"""The decisions of the conformance file that the tests of all bindings read."""
 
 from collections.abc import Iterator
 from pathlib import Path

@@ -1,4 +1,4 @@
-"""What a decoder takes, returns and refuses."""
+"""Inputs, results and refusals of a decoder."""
 
 import copy
 import inspect
@@ -130,7 +130,7 @@ def test_tags(soft):
 
 
 def loud(soft, *positions):
-    """16-bit streams with a value beyond the range in each of the positions."""
+    """16-bit streams with one value beyond the range at each of the positions."""
     streams = [stream.astype(np.int16) for stream in soft]
     for stream, *place, value in positions:
         streams[stream][tuple(place)] = value
@@ -147,7 +147,7 @@ def test_each_kind_of_warning_comes_once(soft):
         "RSC1 systematic value in position 9 saturated negatively, further saturation will not be reported",
     ]
     assert {warning.filename for warning in caught} == {__file__}
-    decoder.decode(*streams, tag=7)  # here a warning is an error
+    decoder.decode(*streams, tag=7)  # warnings are errors here
 
 
 def test_threads_warn_as_one_does(monkeypatch):

@@ -18,7 +18,7 @@ FEW = {"max_blocks": 70, "block_errors": 50}
 
 
 def expect_file(rates, file):
-    """Expects the rates to be those of a result file, but for the times."""
+    """Expects the rates of a result file, except for the times."""
     with open(file, newline="") as lines:
         rows = list(csv.DictReader(lines))
     assert list(rows[0]) == list(rates.dtype.names)

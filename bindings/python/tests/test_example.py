@@ -1,4 +1,4 @@
-"""The example: it runs, and leaves the picture that it promises."""
+"""The example runs and writes its picture."""
 
 import os
 import subprocess

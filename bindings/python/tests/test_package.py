@@ -1,4 +1,4 @@
-"""The package as such: its types, texts and files."""
+"""The package itself: its types, strings and files."""
 
 import doctest
 import inspect

@@ -1,4 +1,4 @@
-"""Threads: those of a call, and those of the caller."""
+"""Threads of a call, and threads of the caller."""
 
 import os
 import subprocess
@@ -25,7 +25,7 @@ def expected(blocks):
 
 
 class Watch:
-    """Counts what happens in this thread while another one is in a call, and how many threads there are then."""
+    """Counts the progress of this thread while another one is in a call, and the number of threads meanwhile."""
 
     def __init__(self, call):
         self.ticks = 0
@@ -61,7 +61,7 @@ def test_other_threads_run_during_a_simulation():
 def test_a_batch_is_spread_over_threads(blocks):
     decoder = morvik.Decoder(threads=5)
     watch = Watch(lambda: decoder.decode(*blocks, iterations=15))
-    assert watch.most_threads >= 1 + 5  # this one, and those of the call
+    assert watch.most_threads >= 1 + 5  # this one, and the threads of the call
 
 
 @pytest.mark.parametrize("threads", [2, 3, 7, 1024])
@@ -123,7 +123,7 @@ def test_closing_waits_for_a_call(blocks, expected):
         assert decoder.closed
         if decoded.exception() is None:
             break
-        assert str(decoded.exception()) == "the decoder is closed"  # before the call had begun
+        assert str(decoded.exception()) == "the decoder is closed"  # before the call began
     assert np.array_equal(decoded.result().bits, expected.bits)
 
 
