@@ -1,5 +1,5 @@
 #!/bin/sh
-# Runs a command and compares what it prints on its standard output with the expected text.
+# Runs a command and compares its standard output with the expected text.
 #   check.sh EXPECTED COMMAND...
 set -eu
 expected=$1

@@ -1,4 +1,4 @@
-// Makes the components of the model one by one, decodes a block with them and looks at a value inside.
+// Creates the components of the model one by one, decodes a block with them and looks at an internal value.
 #include <iostream>
 #include <vector>
 

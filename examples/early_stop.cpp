@@ -1,5 +1,5 @@
-// Stops the decoding of a block as soon as its CRC is right, as receivers do. The core runs all iterations that it is
-// told to, so the blocks that are left are decoded once more, with one iteration more.
+// Stops decoding a block as soon as its CRC is right, as receivers do. The core runs all requested iterations, so the
+// remaining blocks are decoded again, with one more iteration.
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -14,13 +14,13 @@ namespace {
 constexpr std::size_t K = 1024;
 constexpr unsigned mostIterations = 8;
 
-using Block = std::vector<std::int8_t>;  // one stream of it, K + 4 soft values
+using Block = std::vector<std::int8_t>;  // one stream, K + 4 soft values
 struct Received {
     std::vector<Block> sys, par1, par2;
 };
 
-/// Bits 0, sent as -8 steps over a channel whose noise has a standard deviation of 9.2 steps: a sum of four bytes is
-/// near enough to a Gaussian value, and the same everywhere.
+/// Bits 0, sent as -8 steps over a channel with a noise standard deviation of 9.2 steps: a sum of four bytes is close
+/// enough to a Gaussian value, and the same everywhere.
 Block receive(std::mt19937& random)
 {
     Block values(K + 4);
@@ -33,7 +33,7 @@ Block receive(std::mt19937& random)
 }
 
 /// Whether the last 24 of K bits are the CRC of those before: gCRC24B of 3GPP TS 36.212, clause 5.1.1. A block of zeros
-/// has the right one.
+/// has a valid CRC.
 bool crcIsRight(const std::uint8_t* bits)
 {
     std::uint32_t remainder = 0;
@@ -46,7 +46,7 @@ bool crcIsRight(const std::uint8_t* bits)
     return remainder == 0;
 }
 
-/// The stream of some blocks, one after the other, as the batch interface takes them.
+/// A stream of several consecutive blocks, as the batch interface takes them.
 Block joined(const std::vector<Block>& stream, const std::vector<std::size_t>& chosen)
 {
     Block values;
@@ -81,12 +81,12 @@ Decoded decode(veltra_ip_morvik_v1_0_state* state,
                                                 iterations,
                                                 nullptr,
                                                 &outputs) != 0) {
-        std::exit(1);  // the reason stands on the standard error stream
+        std::exit(1);  // the reason is on standard error
     }
     return decoded;
 }
 
-/// Decisions whose ratio is nearer to 0 than 4, in a block.
+/// Number of decisions in a block with a ratio between -4 and 4.
 unsigned doubtful(const std::int16_t* ratios)
 {
     unsigned count = 0;

@@ -1,4 +1,4 @@
-"""The block error rate of a receiver of one's own, and that of `morvik ber` beside it.
+"""The BLER of a custom receiver, beside that of `morvik ber`.
 
 bindings/python/run examples/error_rate.py
 """
@@ -21,7 +21,7 @@ simulated = morvik.error_rate(K, EBN0_DB, max_blocks=20_000)
 with morvik.Decoder(num_pu=4) as decoder:
     for ebn0_db, bler in zip(EBN0_DB, simulated.bler):
         bits = rng.integers(0, 2, (BLOCKS, K), dtype=np.uint8)
-        variance = (3 * K + 12) / (2 * K) / 10 ** (ebn0_db / 10)  # of the noise for bits sent as -1 and 1
+        variance = (3 * K + 12) / (2 * K) / 10 ** (ebn0_db / 10)  # of the noise, for bits sent as -1 and 1
         decoded = decoder.decode(*received(morvik.encode(bits), variance, rng), iterations=8)
         wrong = np.any(decoded.bits != bits, axis=1)
         print(f"{ebn0_db:.1f} dB: {wrong.mean():.4f} of the blocks are wrong, {bler:.4f} with all bits")

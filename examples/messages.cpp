@@ -1,5 +1,5 @@
-// A decoder as a class, which raises what the library writes on the standard streams: errors as exceptions, warnings
-// to the caller.
+// A decoder class that captures the library's output on the standard streams: errors become exceptions, warnings go to
+// the caller.
 #include <iostream>
 #include <memory>
 #include <sstream>
@@ -9,7 +9,7 @@
 
 #include "morvik_v1_0_bitacc_cmodel.h"
 
-/// Takes what is written to a stream for as long as it lives.
+/// Captures a stream during its lifetime.
 class Taken {
 public:
     explicit Taken(std::ostream& stream) : itsStream(stream), itsBuffer(stream.rdbuf(itsText.rdbuf())) {}
@@ -46,7 +46,7 @@ public:
         }
     }
 
-    /// The decisions of a block; `warnings` receives lines such as that of a saturated value.
+    /// The decisions of a block; `warnings` receives lines such as the one for a saturated value.
     std::vector<unsigned char> decode(const std::vector<int> (&streams)[3], unsigned iterations, std::string& warnings)
     {
         const auto size = static_cast<int>(streams[0].size());

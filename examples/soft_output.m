@@ -1,4 +1,4 @@
-% Encodes a block, spoils every ninth value of each stream, and decodes it, with its log-likelihood ratios.
+% Encodes a block, corrupts every ninth value of each stream, and decodes it, with its log-likelihood ratios.
 %
 %   bindings/octave/run examples/soft_output.m
 K = 40;

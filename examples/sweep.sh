@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# What scaling and the correction table are worth: the Eb/N0 at which each algorithm comes down to one wrong block in
-# ten, for some block sizes, from one sweep. Run again, it takes up the results that are there.
+# The gain of scaling and of the correction table: the Eb/N0 at which each algorithm reaches a BLER of 0.1, for some
+# block sizes, from one sweep. When run again, it reuses existing results.
 #
 #   MORVIK=build/x86_64/bin/morvik examples/sweep.sh [RESULTS.csv]
 set -euo pipefail
@@ -8,7 +8,7 @@ results=${1:-sweep.csv}
 "${MORVIK:-morvik}" ber --block-size 40,128,512 --algorithm max-log,scaled,table --ebn0 0:0.5:4 --stop-bler 0.1 \
     --iterations 6 --max-blocks 5000 --output "$results" --resume --quiet
 
-# The last two points of each curve stand around the rate; between them its logarithm is nearly a line.
+# The last two points of each curve enclose the rate; between them its logarithm is nearly linear.
 awk -F, -v rate=0.1 '
     NR == 1 { for (i = 1; i <= NF; ++i) column[$i] = i; next }
     {

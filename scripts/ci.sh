@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Runs at a desk what continuous integration runs: all stages, or the named ones.
+# Runs locally what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
 # named: abi-renew mutate packages starts
@@ -20,30 +20,30 @@ stage_lint() {
         --suppress=internalAstError -I include -I src -I . base src link simulation report testbench trace comparison vectors validation app
 }
 
-# Takes as long again as the rest.
+# Takes as long as all the rest.
 stage_lint-tests() {
     tidy {tests,bench}/'*.cpp'
 }
 
 tidy() {
     scripts/build x86_64
-    # On the standard error stream it counts what it suppresses, and says why it could not run.
+    # Standard error counts what it suppresses, and says why it could not run.
     local log=build/x86_64/lint.log
-    # What clang does not know is left out of the commands.
+    # Flags that clang does not know are removed from the commands.
     mkdir -p build/lint
     sed 's/ -fno-tree-[a-z]*//g' build/x86_64/compile_commands.json >build/lint/compile_commands.json
-    # Two units of bench/ need packages that are not set up here, and Octave's own compiler builds its function.
+    # Two units of bench/ need packages that are not installed here, and Octave's own compiler builds its function.
     git ls-files "$@" |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp|bindings/octave/morvik_mex\.cpp' |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
 }
 
-# The site of the documents, warnings as errors. That their code blocks run is a test.
+# The documents' site, warnings as errors. A separate test runs their code blocks.
 stage_docs() {
     scripts/docs
 }
 
-# Both compilers, all warnings as errors; g++ is in the stage of the tests.
+# Both compilers, all warnings as errors; the tests stage covers g++.
 stage_compilers() {
     local preset
     for preset in clang clang-32; do
@@ -52,7 +52,7 @@ stage_compilers() {
     done
 }
 
-# The binary interface against the committed one, which is kept compressed.
+# The binary interface against the committed one, which is stored compressed.
 stage_abi() {
     local bits
     for bits in 64 32; do
@@ -66,7 +66,7 @@ compare_abi() {
     abidiff "build/abi-$1.xml" "$(library_of "$1")"
 }
 
-# Makes the interface as it is now the committed one, after an intended change.
+# Commits to the current interface, after an intended change.
 stage_abi-renew() {
     local bits
     for bits in 64 32; do
@@ -84,8 +84,8 @@ library_of() {
     echo "build/abi-$1/lib/libmorvik_v1_0_bitacc_cmodel.so"
 }
 
-# Address and undefined behaviour sanitizers on all tests; then valgrind, which sees reads of memory
-# that was never written, on those that decode.
+# Address and undefined behaviour sanitizers on all tests; then valgrind, which detects reads of uninitialised memory,
+# on those that decode.
 stage_memory() {
     scripts/build sanitize
     # Long simulations would take ten minutes here; the other tests of the command run the same code.
@@ -104,9 +104,9 @@ stage_threads() {
     build/threads/tests/simulation_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
 }
 
-# Every fuzzer on its corpus and some thousand inputs made of it, always the same ones. HOSTILE_SECONDS gives each a
-# time instead, and other inputs; HOSTILE_CORPUS names a folder that keeps what long runs find, and where the next run
-# goes on.
+# Every fuzzer on its corpus and some thousand inputs derived from it, always the same ones. HOSTILE_SECONDS gives each
+# a time instead, and other inputs; HOSTILE_CORPUS names a folder that keeps the findings of long runs, from which the
+# next run continues.
 stage_hostile() {
     local fuzzers
     mapfile -t fuzzers < <(sed -n '/^foreach(fuzzer/,/)$/s/^ *\([a-z_]*_fuzz\).*/\1/p' tests/fuzz/CMakeLists.txt)
@@ -145,18 +145,18 @@ count_lines() {
         --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
 }
 
-# Not among the stages that run without being named: it takes most of an hour.
+# Only when named: it takes most of an hour.
 stage_mutate() {
     scripts/mutate
 }
 
-# Not without being named, either: it makes a Debian system from downloads.
+# Only when named: it builds a Debian system from downloads.
 stage_packages() {
     scripts/packages
     tests/packages/clean_root.sh build/packages
 }
 
-# The shortest form of what nobody runs every day, so that it still runs on the day that somebody does.
+# The shortest form of everything that is rarely run, so that it keeps working.
 stage_starts() {
     tidy tests/builds/digest.cpp bench/Limits.cpp
     local preset

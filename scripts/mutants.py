@@ -1,4 +1,4 @@
-"""Mutants: where mistakes are made in the model, which ones, and which of them change nothing that can be seen."""
+"""Mutants: where the model is mutated, how, and which mutants have no observable effect."""
 
 import pathlib
 import re
@@ -6,7 +6,7 @@ from typing import NamedTuple
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
 
-# Where mistakes are made: files, and of them all or the named functions alone.
+# Where to mutate: files, and the named functions in them, or all.
 PLACES = {
     "rules/Arithmetic.h": None,
     "rules/Trellis.h": None,
@@ -40,7 +40,7 @@ PLACES = {
     "rules/BlockSizes.h": ["findBlockSize"],
 }
 
-# What is put in the place of what: operators with a space on both sides or at the end of their line, and words.
+# Replacements: operators with a space on both sides or at the end of their line, and words.
 SWAPS = [("+", "-"), ("-", "+"), ("<", "<="), ("<=", "<"), (">", ">="), (">=", ">"), ("==", "!="), ("!=", "=="),
          ("&&", "||"), ("||", "&&"), ("*", "+"), ("/", "*"), ("^", "|"), ("&", "|"), ("|", "&"), ("<<", ">>"),
          (">>", "<<"), ("%", "/"), ("+=", "-="), ("-=", "+=")]
@@ -48,7 +48,7 @@ WORDS = [("add", "subtract"), ("subtract", "add"), ("addWrap", "subWrap"), ("sub
          ("even", "odd"), ("one", "zero"), ("c1", "c2"), ("c2", "c1"), ("from", "to"), ("to", "from"),
          ("lo", "hi"), ("itsMin", "itsMax"), ("itsMinQ", "itsMaxQ"), ("itsMaxQ", "itsMinQ")]
 
-# Mutants that change nothing that can be seen: of each file why, and the old and new line of each, cut to what matters.
+# Mutants without an observable effect: for each file the reason, and the old and new line of each, cut to what matters.
 EQUIVALENT = {
     "rules/Arithmetic.h": [
         ("a value that equals the limit becomes the limit",
@@ -143,13 +143,13 @@ def function_lines(text, name):
 
 
 def code(line):
-    """The line with comments and texts blanked, so that nothing in them is changed."""
+    """The line with comments and strings blanked, so that nothing in them is mutated."""
     line = re.sub(r'"[^"]*"', lambda m: " " * len(m.group()), line)
     return re.sub(r"//.*", lambda m: " " * len(m.group()), line)
 
 
 def mutations(line):
-    """Pairs of place and new text: start, end, replacement."""
+    """Places and replacements: start, end, new text."""
     text = code(line)
     if text.lstrip().startswith(("#", "template", "using", "static_assert")):
         return

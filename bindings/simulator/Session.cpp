@@ -1,4 +1,4 @@
-// Session: a decoder as a simulator's test bench sees it: filled value by value, read bit by bit, its messages queued.
+// Session: a decoder for a simulator's test bench: filled value by value, read bit by bit, its messages queued.
 #include "Session.h"
 
 #include <mutex>
@@ -15,10 +15,10 @@ namespace {
 constexpr std::size_t tail = 4;
 constexpr std::size_t mostPositions = standard::blockSizes.back().K + tail;
 
-/// Held while the library is listened to: its streams are those of the process.
+/// Held while the library's output is captured: its streams are process-wide.
 std::mutex turn;
 
-/// What the library does not say: how the caller may have come to a size that no block has.
+/// Explains an invalid size: how the caller may have come to it.
 std::string sizeHint(std::size_t positions)
 {
     const std::string count = std::to_string(positions);
@@ -64,7 +64,7 @@ void Session::put(int sys, int par1, int par2) noexcept
 int Session::decode(int iterations, std::uint32_t tag)
 {
     itsBits.clear();
-    const std::size_t positions = std::exchange(itsPositions, 0U);  // forgotten however the call ends
+    const std::size_t positions = std::exchange(itsPositions, 0U);  // cleared however the call ends
     int status = 1;
     if (!open()) {
         itsMessages.emplace_back("ERROR:binding:The generics of this decoder were refused, so it does not decode");
@@ -79,7 +79,7 @@ int Session::decode(int iterations, std::uint32_t tag)
     return status;
 }
 
-/// What it delivers is taken over last, so that exhausted memory leaves none of it.
+/// Results are stored last, so that running out of memory leaves none of them.
 int Session::simulate(std::size_t positions, int iterations, std::uint32_t tag)
 {
     std::array<std::uint8_t, mostPositions> bits;

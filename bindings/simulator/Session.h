@@ -1,6 +1,6 @@
-// Session: a decoder as a simulator's test bench sees it: filled value by value, read bit by bit, its messages queued.
+// Session: a decoder for a simulator's test bench: filled value by value, read bit by bit, its messages queued.
 //
-// The bindings of simulators whose interfaces disagree on arrays are thin over it.
+// Bindings for simulators whose interfaces disagree on arrays are thin layers over it.
 #ifndef MORVIK_BINDINGS_SIMULATOR_SESSION_H
 #define MORVIK_BINDINGS_SIMULATOR_SESSION_H
 
@@ -15,10 +15,10 @@
 
 namespace morvik::simulator {
 
-/// Nothing is written to the standard streams. They are process-wide, so the calls of all sessions take turns.
+/// Writes nothing to the standard streams. They are process-wide, so the calls of all sessions take turns.
 class Session {
 public:
-    /// A decoder whose generics are refused is not `open`, and a message tells why.
+    /// If the generics are refused, the decoder is not `open`, and a message says why.
     Session(int numPu, int algorithm, int tagWidth);
     ~Session();
     Session(const Session&) = delete;
@@ -32,11 +32,11 @@ public:
     /// Appends a position to the next block.
     void put(int sys, int par1, int par2) noexcept;
 
-    /// Decodes the positions that were put since the last call, K + 4, and forgets them. Returns the status of the C
-    /// interface, 0 when decoded. Memory exhausted outside of it throws std::bad_alloc.
+    /// Decodes the positions put since the last call, K + 4, and clears them. Returns the status of the C interface, 0
+    /// when decoded. Throws std::bad_alloc if memory runs out outside of it.
     int decode(int iterations, std::uint32_t tag);
 
-    /// The decisions of the last decode, none when it was refused.
+    /// The decisions of the last decode, none if it was refused.
     const std::vector<std::uint8_t>& bits() const
     {
         return itsBits;
@@ -47,8 +47,8 @@ public:
         return itsTag;
     }
 
-    /// Takes the oldest line from the queue of messages: "ERROR:..." or "WARNING:...", or an empty text when there is
-    /// none. The text lasts until the next call.
+    /// Takes the oldest line from the message queue: "ERROR:..." or "WARNING:...", or an empty string if there is none.
+    /// The string is valid until the next call.
     const std::string& nextMessage();
 
 private:
@@ -57,7 +57,7 @@ private:
 
     veltra_ip_morvik_v1_0_state* itsState = nullptr;
     std::array<std::vector<std::int32_t>, 3> itsStreams;
-    std::size_t itsPositions = 0;  ///< put, also beyond what the streams hold
+    std::size_t itsPositions = 0;  ///< positions put, also beyond what the streams hold
     std::vector<std::uint8_t> itsBits;
     std::uint32_t itsTag = 0;
     std::deque<std::string> itsMessages;

@@ -1,5 +1,5 @@
-// MorvikDecoder: the bit-accurate model of the turbo decoder as a SystemC module: blocks of soft values come from one
-// FIFO, decisions go to another. docs/systemc.md explains it.
+// MorvikDecoder: the bit-accurate model of the turbo decoder as a SystemC module: reads blocks of soft values from one
+// FIFO and writes decisions to another. docs/systemc.md explains it.
 #ifndef MORVIK_BINDINGS_SYSTEMC_MORVIKDECODER_H
 #define MORVIK_BINDINGS_SYSTEMC_MORVIKDECODER_H
 
@@ -22,13 +22,13 @@ struct MorvikSoftBlock {
     std::uint32_t tag = 0;
 };
 
-/// What comes of a block: K decisions, each 0 or 1, or none when it was refused.
+/// The result for a block: K decisions, each 0 or 1, or none if it was refused.
 struct MorvikDecisions {
     std::vector<std::uint8_t> bits;
     std::uint32_t tag = 0;
 };
 
-// FIFOs print what they hold.
+// FIFOs print their contents.
 inline std::ostream& operator<<(std::ostream& os, const MorvikSoftBlock& block)
 {
     return os << block.sys.size() << " positions, tag " << block.tag;
@@ -39,8 +39,8 @@ inline std::ostream& operator<<(std::ostream& os, const MorvikDecisions& decisio
     return os << decisions.bits.size() << " decisions, tag " << decisions.tag;
 }
 
-/// What the model refuses and warns of becomes reports of the type "morvik". An error report throws, unless
-/// sc_report_handler is told otherwise; then a refused block gives no decisions.
+/// Refusals and warnings of the model become reports of type "morvik". An error report throws, unless sc_report_handler
+/// is told otherwise; then a refused block gives no decisions.
 class MorvikDecoder : public sc_core::sc_module {
 public:
     sc_core::sc_fifo_in<MorvikSoftBlock> in;
@@ -76,7 +76,7 @@ public:
     }
 
 private:
-    /// Collects what the model writes on the standard streams.
+    /// Captures what the model writes on the standard streams.
     class Listener {
     public:
         Listener() : itsOutput(std::cout.rdbuf(&itsText)), itsError(std::cerr.rdbuf(&itsText)) {}
@@ -89,7 +89,7 @@ private:
         Listener(const Listener&) = delete;
         Listener& operator=(const Listener&) = delete;
 
-        /// Reports every line, an error followed by `hint`. An error may throw.
+        /// Reports every line, and adds `hint` to errors. An error may throw.
         void report(const std::string& hint = "")
         {
             giveBack();

@@ -1,10 +1,10 @@
 // example: a self-checking SystemC test bench. A source sends recorded blocks to the model, and a scoreboard compares
-// what comes of them with the decisions of a device under test, for which a file stands in.
+// the results with the decisions of a device under test, which a file replaces.
 //
 //     example K SOFT DECISIONS [BLOCK BIT]
 //
-// SOFT has a header, then a row BLOCK,SYS,PAR1,PAR2 for each of the K + 4 positions of a block; DECISIONS a line of K
-// bits for each block. BLOCK and BIT turn a bit over, as a bug of the device would.
+// SOFT has a header, then a row BLOCK,SYS,PAR1,PAR2 for each of the K + 4 positions of a block; DECISIONS has a line of
+// K bits for each block. BLOCK and BIT invert a bit, like a bug of the device.
 #include <cstdlib>
 #include <fstream>
 #include <iostream>

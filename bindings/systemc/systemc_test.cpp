@@ -1,6 +1,6 @@
-// Tests of the SystemC module: the conformance file, and what wrong use is told.
+// Tests of the SystemC module: the conformance file, and the messages for wrong use.
 //
-// SystemC has one elaboration in a process, so all decoders stand side by side and the tests feed them in turn.
+// SystemC allows one elaboration per process, so all decoders exist at once and the tests feed them in turn.
 #include <array>
 #include <fstream>
 #include <iostream>
@@ -78,7 +78,7 @@ int sc_main(int argc, char* argv[])
         std::cerr << "systemc_test CONFORMANCE_FILE\n";
         return 2;
     }
-    // As it is without a handler: an error throws.
+    // The default without a handler: an error throws.
     try {
         const MorvikDecoder refused("refused", 3, 1, 8);
         expect("generics", "accepted", "refused");

@@ -15,7 +15,7 @@ Session* sessionOf(void* decoder)
     return static_cast<Session*>(decoder);
 }
 
-/// Memory is all that can fail in a session.
+/// Only memory can fail in a session.
 constexpr int outOfMemory = 99;
 
 }  // namespace

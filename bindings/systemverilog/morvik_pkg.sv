@@ -38,13 +38,13 @@ package morvik_pkg;
 
     morvik_reporter morvik_log;
 
-    // A decoder. Call destroy when done with it: its memory is outside of the simulator's.
+    // A decoder. Call destroy when done with it: its memory is outside the simulator's.
     class morvik_decoder;
-        // What the last call gave.
+        // Results of the last call.
         int status;             // 0 decoded, 1 an argument was refused, 2 the block was refused, 99 out of memory
-        string message;         // every line that the model wrote, separated by line feeds
-        decisions_t dout;       // K decisions; none when the block was refused
-        int unsigned dout_tag;  // the tag, cut to tag_width bits
+        string message;         // all lines that the model wrote, separated by line feeds
+        decisions_t dout;       // K decisions; none if the block was refused
+        int unsigned dout_tag;  // the tag, truncated to tag_width bits
 
         local chandle handle;
         local bit destroyed;
@@ -71,7 +71,7 @@ package morvik_pkg;
             input int iterations = 8,
             input int unsigned tag = 0
         );
-            int result;  // and not status: Verilator 5.006 takes a member for unchanged by the calls in between
+            int result;  // not status: Verilator 5.006 assumes that calls in between do not change a member
             result = 1;
             message = "";
             dout = new[0];

@@ -22,7 +22,7 @@ package morvik_pkg is
     -- Soft values of a stream, -128 to 127; positive ones favour bit 1.
     type morvik_soft_values is array (natural range <>) of integer;
 
-    -- Makes a decoder and returns its number, or 0 after a report with severity error.
+    -- Makes a decoder and returns its number, or 0 after a report of severity error.
     --   num_pu       processing units: 2, 4 or 8
     --   tag_width    bits of the block tag: 0 to 32
     impure function morvik_create (
@@ -31,8 +31,8 @@ package morvik_pkg is
         tag_width : integer := 8
     ) return integer;
 
-    -- Decodes a block. sys, par1 and par2 hold K + 4 values each, the tail included; bits holds K. When status is not
-    -- morvik_decoded, a report with severity error tells why, and bits are zeros.
+    -- Decodes a block. sys, par1 and par2 hold K + 4 values each, the tail included; bits holds K. If status is not
+    -- morvik_decoded, a report of severity error says why, and bits are zeros.
     procedure morvik_decode (
         decoder    : in  integer;
         sys        : in  morvik_soft_values;
@@ -44,13 +44,13 @@ package morvik_pkg is
         tag        : in  integer := 0
     );
 
-    -- The tag of the last block that was decoded, cut to tag_width bits. A tag of 32 bits keeps its sign bit.
+    -- The tag of the last decoded block, truncated to tag_width bits. A tag of 32 bits keeps its sign bit.
     impure function morvik_tag (decoder : integer) return integer;
 
-    -- Releases a decoder. A number that is none is let through.
+    -- Releases a decoder. An unknown number is ignored.
     procedure morvik_destroy (decoder : in integer);
 
-    -- The functions of the C library, which the ones above are made of.
+    -- The functions of the C library, on which the ones above are built.
     impure function morvik_vhdl_create (num_pu, algorithm, tag_width : integer) return integer;
     procedure morvik_vhdl_destroy (decoder : in integer);
     impure function morvik_vhdl_is_open (decoder : integer) return integer;
@@ -90,7 +90,7 @@ package body morvik_pkg is
         end if;
     end procedure report_line;
 
-    -- Reports what the library has to say about a decoder.
+    -- Reports the library's messages about a decoder.
     procedure report_messages (decoder : in integer) is
         variable length : natural;
 
@@ -181,7 +181,7 @@ package body morvik_pkg is
         morvik_vhdl_destroy(decoder);
     end procedure morvik_destroy;
 
-    -- Never called: the functions of the library take their places.
+    -- Never called: the library's functions replace them.
 
     impure function morvik_vhdl_create (num_pu, algorithm, tag_width : integer) return integer is
     begin

@@ -1,8 +1,7 @@
 // morvik_vhdl: the C functions that morvik_pkg.vhd declares as foreign.
 //
-// Integers of 32 bits are what all simulators hand over alike, so a decoder is a number, and a message is read
-// character by character. A number that is no decoder is let through by every function. No exception passes into the
-// simulator. A simulation runs in one thread.
+// All simulators pass 32-bit integers alike, so a decoder is a number, and a message is read character by character.
+// Every function ignores an unknown number. No exception passes into the simulator. A simulation runs in one thread.
 #include <cstddef>
 #include <cstdint>
 #include <exception>
@@ -15,7 +14,7 @@ namespace {
 
 using morvik::simulator::Session;
 
-/// Decoders by their number. They live to the end of the simulation if nobody destroys them.
+/// Decoders by number. They live to the end of the simulation unless destroyed.
 std::map<std::int32_t, Session>& sessions()
 {
     static std::map<std::int32_t, Session> all;
@@ -28,22 +27,22 @@ Session* find(std::int32_t decoder)
     return found == sessions().end() ? nullptr : &found->second;
 }
 
-/// The message that was taken last.
+/// The last message taken.
 std::string& taken()
 {
     static std::string message;
     return message;
 }
 
-/// Memory is all that can fail in a session.
+/// Only memory can fail in a session.
 constexpr std::int32_t outOfMemory = 99;
 
 }  // namespace
 
 extern "C" {
 
-/// A number from 1 that no other decoder has had, or 0 when memory is exhausted. Generics that are refused leave a
-/// decoder that is not open, whose message tells why.
+/// A number from 1 that no other decoder has had, or 0 if memory is exhausted. Refused generics leave a decoder that is
+/// not open, whose message says why.
 MORVIK_API std::int32_t morvik_vhdl_create(std::int32_t numPu, std::int32_t algorithm, std::int32_t tagWidth)
 {
     static std::int32_t last = 0;
@@ -60,7 +59,7 @@ MORVIK_API void morvik_vhdl_destroy(std::int32_t decoder)
     sessions().erase(decoder);
 }
 
-/// 1 when the number is that of a decoder whose generics were accepted, else 0.
+/// 1 if the number is that of a decoder whose generics were accepted, else 0.
 MORVIK_API std::int32_t morvik_vhdl_is_open(std::int32_t decoder)
 {
     const Session* const session = find(decoder);
@@ -75,7 +74,7 @@ MORVIK_API void morvik_vhdl_put(std::int32_t decoder, std::int32_t sys, std::int
     }
 }
 
-/// Decodes the positions that were put since the last call, and forgets them. Returns the status of the C interface.
+/// Decodes the positions put since the last call, and clears them. Returns the status of the C interface.
 MORVIK_API std::int32_t morvik_vhdl_decode(std::int32_t decoder, std::int32_t iterations, std::int32_t tag)
 {
     Session* const session = find(decoder);
@@ -89,7 +88,7 @@ MORVIK_API std::int32_t morvik_vhdl_decode(std::int32_t decoder, std::int32_t it
     }
 }
 
-/// What the last decode gave: a decision, and the tag.
+/// Results of the last decode: a decision, and the tag.
 MORVIK_API std::int32_t morvik_vhdl_bit(std::int32_t decoder, std::int32_t position)
 {
     const Session* const session = find(decoder);
@@ -103,7 +102,7 @@ MORVIK_API std::int32_t morvik_vhdl_tag(std::int32_t decoder)
     return session == nullptr ? 0 : static_cast<std::int32_t>(session->tag());
 }
 
-/// Takes the oldest message of a decoder and returns its length, 0 when there is none; then its characters, from 1.
+/// Takes the oldest message of a decoder and returns its length, 0 if there is none; then its characters, from 1.
 MORVIK_API std::int32_t morvik_vhdl_message(std::int32_t decoder)
 {
     taken().clear();

@@ -1,6 +1,6 @@
-// dut_stand_in: takes the place of the turbo decoder core in the example. It accepts the K + 4 positions of a block, one
-// with each clock, and then plays the decisions that a set of vectors expects, one bit with each clock. +break_block=B
-// +break_bit=I turns bit I of block B over, as a bug would.
+// dut_stand_in: replaces the turbo decoder core in the example. It accepts the K + 4 positions of a block, one per
+// clock, and then plays back the expected decisions of a set of vectors, one bit per clock. +break_block=B +break_bit=I
+// inverts bit I of block B, like a bug.
 module dut_stand_in (
     input logic clk,
     input logic [31:0] K,  // stable from the first position of a block to its last decision
@@ -12,7 +12,7 @@ module dut_stand_in (
     output logic dout
 );
     string set;
-    bit expected[int];  // the bits of all blocks, one after the other
+    bit expected[int];  // the bits of all blocks, consecutively
     int break_block, break_bit;
     int block = 0, position = 0, playing = -1, played = 0;
 

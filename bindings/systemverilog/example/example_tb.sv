@@ -1,5 +1,5 @@
-// example_tb: a self-checking test bench. It hands the blocks of a set of vectors to a device under test and to the
-// model, and compares what they decide.
+// example_tb: a self-checking test bench. It passes the blocks of a set of vectors to a device under test and to the
+// model, and compares their decisions.
 //
 //     +set=DIR   made by: morvik vectors --out DIR --format memh
 module example_tb;
@@ -10,7 +10,7 @@ module example_tb;
 
     localparam int longest_idle = 100_000;  // clocks: more than a core needs for a block
 
-    // The words of a set, which docs/vectors.md lays out.
+    // The words of a set; docs/vectors.md describes their layout.
     typedef struct packed {
         bit [31:0] first_bit, first_position, expected_tag, tag;
         bit [3:0] iterations;
@@ -34,7 +34,7 @@ module example_tb;
     morvik_decoder model;
     int bits = 0, wrong_bits = 0;
 
-    // The core that the set is for stands in its manifest, a parameter in each line.
+    // The manifest has the core's configuration, one parameter per line.
     function automatic void read_manifest(output int num_pu, output int algorithm);
         int file, width;
         string line, name;
@@ -52,7 +52,7 @@ module example_tb;
             $fatal(1, "%s has soft values of %0d bits, this test bench reads --width 8", set, width);
     endfunction
 
-    // The model decides at once, and so before the device does.
+    // The model decides at once, before the device.
     function automatic void decode(input block_word block);
         soft_values_t soft_sys, soft_par1, soft_par2;
         position_word position;
@@ -69,7 +69,7 @@ module example_tb;
             $fatal(1, "the model does not decode: %s", model.message);
     endfunction
 
-    // Everything is driven and looked at between two rising edges.
+    // All signals are driven and sampled between two rising edges.
     task automatic drive(input block_word block);
         for (int i = 0; i < K + 4; i++) begin
             @(negedge clk);

@@ -11,7 +11,7 @@ module conformance_tb;
         return value;
     endfunction
 
-    // Decodes the next block of the file; returns whether the decisions are as it says.
+    // Decodes the next block of the file; returns whether the decisions are the expected ones.
     function automatic bit check_block(int number);
         morvik_decoder model;
         soft_values_t sys, par1, par2;

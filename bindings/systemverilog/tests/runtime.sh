@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Checks what a library needs of the C++ runtime: symbols of no later version than LATEST, and that one; or with the word
-# none, neither libstdc++ nor libgcc_s at all.
+# Checks the C++ runtime that a library needs: symbols of version LATEST, and no later one; or with the word none,
+# neither libstdc++ nor libgcc_s at all.
 #   runtime.sh LIBRARY LATEST|none
 set -euo pipefail
 library=$1

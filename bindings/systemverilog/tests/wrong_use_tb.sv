@@ -1,5 +1,5 @@
-// wrong_use_tb: what test benches do wrong, and what they are told. +report takes the class as it is, whose messages
-// reach the simulator's log; otherwise they are collected and compared.
+// wrong_use_tb: mistakes of test benches, and their messages. +report uses the class unchanged, whose messages reach
+// the simulator's log; otherwise they are collected and compared.
 module wrong_use_tb;
     import morvik_pkg::*;
 
@@ -95,7 +95,7 @@ module wrong_use_tb;
         model.destroy();
     endfunction
 
-    // The class as it is.
+    // The class unchanged.
     function automatic void report();
         morvik_decoder model;
         model = new(3);

@@ -1,5 +1,5 @@
--- decoder_stand_in: stands where the design under test will be. It takes the soft values of a block, one position each
--- clock, and then plays the decisions that a set of vectors expects, one each clock. A generic breaks one of them.
+-- decoder_stand_in: replaces the design under test. It takes the soft values of a block, one position per clock, and
+-- then plays back the expected decisions of a set of vectors, one per clock. A generic breaks one of them.
 library ieee;
 use ieee.std_logic_1164.all;
 use std.textio.all;

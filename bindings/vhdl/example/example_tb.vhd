@@ -24,7 +24,7 @@ architecture bench of example_tb is
     signal out_valid : std_logic;
     signal out_bit   : std_logic;
 
-    -- The core that the set is for stands in its manifest.
+    -- The manifest has the core's configuration.
     impure function algorithm return integer is
         constant name : string := manifest_value(set & "/manifest.json", "algorithm");
     begin

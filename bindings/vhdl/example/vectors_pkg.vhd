@@ -2,10 +2,10 @@
 use std.textio.all;
 
 package vectors_pkg is
-    -- A parameter of the manifest as it stands there, such as 4 or "scaled".
+    -- A parameter of the manifest as written there, such as 4 or "scaled".
     impure function manifest_value (manifest : string; name : string) return string;
 
-    -- A row of blocks.csv; what follows in it is left out.
+    -- A row of blocks.csv, without its later columns.
     procedure read_block (file blocks : text; size, iterations : out integer);
 
     -- A row of stimulus.csv.
@@ -33,13 +33,13 @@ package body vectors_pkg is
         return "";
     end function manifest_value;
 
-    -- The next number of a row, and the comma behind it.
+    -- The next number of a row, and the comma after it.
     procedure take (row : inout line; number : out integer) is
         variable comma : character;
         variable good  : boolean;
     begin
         read(row, number);
-        read(row, comma, good);  -- none behind the last
+        read(row, comma, good);  -- none after the last
     end procedure take;
 
     procedure read_block (file blocks : text; size, iterations : out integer) is

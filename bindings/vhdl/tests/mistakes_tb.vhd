@@ -1,4 +1,4 @@
--- mistakes_tb: the table of docs/vhdl.md: how many bits are wrong when soft values are handed over the wrong way.
+-- mistakes_tb: the table of docs/vhdl.md: the number of wrong bits if soft values are passed the wrong way.
 use std.textio.all;
 use work.morvik_pkg.all;
 use work.vectors_pkg.all;
@@ -42,7 +42,7 @@ architecture bench of mistakes_tb is
         return (sent.sys, sent.par2, sent.par1);
     end function swapped;
 
-    -- Each encoder's tail bits beside their parity bits: the first one's in three rows, then the second one's.
+    -- Each encoder's tail bits beside their parity bits: the first encoder's in three rows, then the second's.
     function tail_in_rows (sent : soft_block) return soft_block is
         variable result : soft_block := sent;
     begin
@@ -52,7 +52,7 @@ architecture bench of mistakes_tb is
         return result;
     end function tail_in_rows;
 
-    -- The last bit first, before the tail.
+    -- The bits reversed, before the tail.
     function reversed (sent : soft_block) return soft_block is
         variable result : soft_block := sent;
     begin

@@ -1,4 +1,4 @@
--- wrong_use_tb: what people may do wrong. wrong_use.expected has what they are told.
+-- wrong_use_tb: mistakes of users. wrong_use.expected has the messages.
 use work.morvik_pkg.all;
 
 entity wrong_use_tb is
