@@ -5,13 +5,13 @@
 %   [bits, ratios, tags] = morvik_decode(...)
 %
 % sys, par1, par2   soft values of the systematic and of the two parity streams (d(0), d(1), d(2) of 3GPP TS 36.212):
-%                   matrices of K + 4 rows, a block in each column, its tail in the last four rows. One block may also
-%                   be three rows; then bits and ratios are rows, too. A positive value favours bit 1, and 8 steps make
-%                   one. They are clipped to -128 ... 127. int8, int16 and int32 are decoded as they are; values of
-%                   other classes have to be whole numbers. Unsigned ones are refused.
+%                   matrices of K + 4 rows, one block per column, its tail in the last four rows. A single block may
+%                   also be three rows; then bits and ratios are rows, too. A positive value favours bit 1, with 8 steps
+%                   per unit. Values are clipped to -128 ... 127. int8, int16 and int32 are decoded directly; values of
+%                   other classes must be integers. Unsigned classes are refused.
 % bits              K decisions in each column, logical
-% ratios            log-likelihood ratios of the decisions, int16, 128 steps to one
-% tags              block tags, cut to tag_width bits, a row of uint32
+% ratios            log-likelihood ratios of the decisions, int16, 128 steps per unit
+% tags              block tags, truncated to tag_width bits, a row of uint32
 %
 % Options and their defaults:
 %
@@ -24,8 +24,8 @@
 %   class       'logical'  class of bits: 'logical' or 'int8'
 %
 % Errors:    morvik:badCall, morvik:badOption, morvik:badClass, morvik:badSize, morvik:badValue, morvik:outOfMemory
-% Warnings:  morvik:saturated, morvik:tagTruncated, for the first value of a call that is concerned. They are switched
-%            off by warning('off', 'morvik:saturated').
+% Warnings:  morvik:saturated, morvik:tagTruncated, for the first such value of a call. Switch them off by
+%            warning('off', 'morvik:saturated').
 %
 % Example: a block of 40 bits over a noisy channel
 %

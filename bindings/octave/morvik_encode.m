@@ -2,8 +2,8 @@
 %
 %   [sys, par1, par2] = morvik_encode(bits)
 %
-% bits              zeros and ones: a matrix of K rows, a block in each column, with a block size K of TS 36.212, Table
-%                   5.1.3-3 (40 to 6144). One block may also be a row; then the streams are rows, too.
+% bits              zeros and ones: a matrix of K rows, one block per column, with a block size K of TS 36.212, Table
+%                   5.1.3-3 (40 to 6144). A single block may be a row; then the streams are rows, too.
 % sys, par1, par2   the systematic and the two parity streams, d(0), d(1), d(2) of TS 36.212: logical, K + 4 rows. The
 %                   last four rows are the tail, in the order in which morvik_decode takes it.
 %

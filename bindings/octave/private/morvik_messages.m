@@ -1,4 +1,4 @@
-% Raises what the library has to say about a call as errors and warnings.
+% Raises the library's messages about a call as errors and warnings.
 %
 %   morvik_messages(caller, status, messages, rows, column)
 %

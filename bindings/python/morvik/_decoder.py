@@ -47,7 +47,7 @@ class Decoder:
     """A turbo decoder, bit-accurate to the hardware core with these generics.
 
     ``num_pu``
-        Parallel processing units: 2, 4 or 8. Like the next two, the library's default when it is not given: 2,
+        Parallel processing units: 2, 4 or 8. The defaults of this and the next two are the library's: 2,
         ``"scaled"``, 8.
     ``algorithm``
         ``"max-log"``, ``"scaled"`` (extrinsic values times 0.75) or ``"table"`` (correction table); or 0, 1, 2.
@@ -59,10 +59,10 @@ class Decoder:
         ``"avx512"``, ``"avx2"``, ``"ssse3"``, ``"generic"`` or ``"component"``; the fastest when None. All give the
         same bits.
 
-    What the decoder refuses raises :class:`morvik.Error`, a ``ValueError``, with the decoder's reason.
+    A refusal raises :class:`morvik.Error`, a ``ValueError``, with the decoder's reason.
 
-    A decoder may be closed, by :meth:`close` or as a context manager, to release its memory early. Threads should have
-    a decoder each: those that share one wait for each other.
+    Close a decoder, by :meth:`close` or as a context manager, to release its memory early. Give each thread its own
+    decoder: threads that share one wait for each other.
     """
 
     def __init__(
@@ -101,11 +101,11 @@ class Decoder:
         ``sys``, ``par1``, ``par2``
             Soft values: the systematic bits and the parities of the first and the second encoder, each of shape
             (K + 4,) for a block or (n, K + 4) for a batch. The last four positions hold the twelve tail values in the
-            order of :func:`encode`, that of the standard. 8 steps make one; a positive value favours bit 1. The core
-            looks at the low 24 bits of a value and clips them to -128 ... 127.
+            order of :func:`encode`, that of the standard. 8 steps per unit; a positive value favours bit 1. The core
+            takes the low 24 bits of a value and clips them to -128 ... 127.
 
-            int8, int16 and int32 in C order are read where they are; other signed integers, orders and strides are
-            copied. Anything but signed integers raises ``TypeError``.
+            int8, int16 and int32 in C order are read in place; other signed integers, orders and strides are copied.
+            Anything but signed integers raises ``TypeError``.
         ``iterations``
             Full turbo iterations, 1 to 15; all of them are run.
         ``tag``

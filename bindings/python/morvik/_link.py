@@ -78,15 +78,15 @@ def awgn(
     ``ebn0_db``
         Eb/N0 in dB, -50 to 50 in steps of 0.001; it counts the energy of the tail, at a rate of K / (3 K + 12).
     ``algorithm``
-        The one of the decoder, which the scale is to suit.
+        The decoder's algorithm, for which the scale is chosen.
     ``scale``
-        Steps of a soft value for amplitude 1: above 0, up to 1000. None takes what suits the algorithm: 8 for
+        Steps of a soft value for amplitude 1: above 0, up to 1000. None chooses it for the algorithm: 8 for
         ``"max-log"`` and ``"scaled"``, 8 / variance of the noise for ``"table"``.
     ``rng``
         A NumPy generator, or the seed of a new one.
 
     Returns int8 of the same shapes, rounded and clipped to -128 ... 127: what :meth:`Decoder.decode` takes.
-    :func:`error_rate` makes its noise without NumPy, and many times as fast.
+    :func:`error_rate` makes its noise without NumPy, many times faster.
     """
     arrays = [_bits(name, stream) for name, stream in zip(Streams._fields, _three(streams))]
     positions = arrays[0].shape[-1]

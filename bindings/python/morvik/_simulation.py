@@ -85,11 +85,11 @@ def error_rate(
     ``block_size``
         K, one of :data:`block_sizes`.
     ``ebn0_db``
-        Eb/N0 in dB, -50 to 50 in steps of 0.001; None takes the range where rates of the size fall.
+        Eb/N0 in dB, -50 to 50 in steps of 0.001; None chooses the waterfall range of the size.
     ``num_pu``, ``algorithm``
         As for :class:`Decoder`, with the same defaults.
     ``scale``
-        Steps of a soft value for amplitude 1, above 0 up to 1000; None takes what suits the algorithm.
+        Steps of a soft value for amplitude 1, above 0 up to 1000; None chooses it for the algorithm.
     ``iterations``
         1 to 15; with ``each_iteration``, errors after each iteration up to the number are counted.
 
