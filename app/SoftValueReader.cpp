@@ -147,8 +147,8 @@ SoftBlock readBlock(const std::string& file, std::uint32_t number)
                                 std::to_string(number));
         }
     }
-    if (block.size() < tailPositions ||
-        standard::findBlockSize(static_cast<std::uint32_t>(block.size() - tailPositions)) == nullptr) {
+    if (block.size() < rules::tailPositions ||
+        standard::findBlockSize(static_cast<std::uint32_t>(block.size() - rules::tailPositions)) == nullptr) {
         reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
     }
     return block;

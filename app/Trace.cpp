@@ -87,13 +87,13 @@ void appendUnit(const std::string& text, std::vector<std::uint32_t>& units)
     units.push_back(*unit);
 }
 
-void checkUnits(const Options& options, const Division& division)
+void checkUnits(const Options& options, const rules::Cut& cut)
 {
     for (const std::uint32_t unit : options.selection.units) {
-        if (unit >= division.units()) {
-            const std::uint32_t last = division.units() - 1;
+        if (unit >= cut.unitsAtWork()) {
+            const std::uint32_t last = cut.unitsAtWork() - 1;
             throw simulation::Error("--units: unit " + std::to_string(unit) + " computes nothing of a block of " +
-                                    std::to_string(division.K()) + " bits with --num-pu " +
+                                    std::to_string(cut.K()) + " bits with --num-pu " +
                                     std::to_string(options.decoder.generics.C_NUM_PU) + ", unit" +
                                     (last > 0 ? "s 0 to " + std::to_string(last) + " do" : " 0 does"));
         }
@@ -110,10 +110,10 @@ base::OutputFile openOutput(const Options& options)
     return file;
 }
 
-std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const Division& division)
+std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const rules::Cut& cut)
 {
     if (options.format == "vcd") {
-        return trace::vcdTrace(openOutput(options), division, options.selection);
+        return trace::vcdTrace(openOutput(options), cut, options.selection);
     }
     const vectors::Table table = trace::traceTable(options.selection);
     auto rows = options.format == "csv" ? vectors::csvWriter(openOutput(options), table)
@@ -139,8 +139,8 @@ void write(Options options)
         }
     }
     Passes passes(block, options.decoder.generics, std::cerr);
-    checkUnits(options, passes.division());
-    const auto writer = writerOf(options, passes.division());
+    checkUnits(options, passes.cut());
+    const auto writer = writerOf(options, passes.cut());
     for (std::uint32_t halfIteration = 0; halfIteration <= selection.last; ++halfIteration) {
         passes.next();
         if (halfIteration >= selection.first) {

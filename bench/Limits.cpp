@@ -7,7 +7,7 @@
 #include "Measure.h"
 #include "Probe.h"
 #include "lanes/InstructionSets.h"
-#include "src/Segmentation.h"
+#include "rules/Cut.h"
 
 // Each compilation of Probe.cpp defines one of these.
 namespace probe_generic {
@@ -52,8 +52,7 @@ const lanes::InstructionSet* instructionSet(const std::string& name)
 /// Lanes of the vectors used by the work.
 unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
 {
-    constexpr std::uint64_t threads = 4;  // per processing unit
-    const unsigned segments = segmentation::segmentCount(work.blockSize, threads * static_cast<unsigned>(work.units));
+    const unsigned segments = rules::Cut(work.blockSize, static_cast<unsigned>(work.units)).segments();
     return lanes::kernelFor(set, segments, work.call == Work::Call::batch ? work.blocks : 1).vectorLanes;
 }
 

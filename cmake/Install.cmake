@@ -32,7 +32,7 @@ set(MORVIK_CLASS_HEADERS
     TNumberFormat.h)
 list(TRANSFORM MORVIK_CLASS_HEADERS PREPEND ${PROJECT_SOURCE_DIR}/src/)
 install(FILES ${MORVIK_CLASS_HEADERS} DESTINATION ${classes_dir})
-install(FILES rules/Arithmetic.h DESTINATION ${classes_dir}/rules)
+install(DIRECTORY rules DESTINATION ${classes_dir} FILES_MATCHING PATTERN *.h)
 target_include_directories(morvik_classes INTERFACE $<INSTALL_INTERFACE:${classes_dir}>)
 
 set(commands morvik)

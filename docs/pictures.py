@@ -357,7 +357,7 @@ def flow():
                           text(way.middle + side * 8, end + 40, label, "end" if side < 0 else "start", "small")]
 
     left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/SimulationCall.cpp: loadLanes",
-                                "src/LanePath.cpp: takes, prepare, segmentCount, windowStarts"),
+                                "src/LanePath.cpp: takes, prepare"),
                           ("A row for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
                            "lanes/Transpose.h: loadRows"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
@@ -369,7 +369,7 @@ def flow():
 
     right = components.stations(top, ("Values are clipped and joined", "src/SimulationCall.cpp: decodeByComponents"),
                                 ("Streams and tail, segments and windows", "src/TDecoder3G.cpp: decode, extract",
-                                 "src/TDecoder3GPU.cpp: allocate, buildSegments", "src/Segmentation.cpp: segmentCount, windowStarts"),
+                                 "src/TDecoder3GPU.cpp: allocate, buildSegments", "rules/Cut.h: segmentCount, windowStart"),
                                 ("A half-iteration", "src/TDecoder3G.cpp: calcSISO, calcIntrinsic, calcLLR, calcExtrinsic",
                                  "src/TDecoder3GPU.cpp: calcGamma, calcAlpha, calcBeta",
                                  "src/TCalculationEngineModBase.cpp: gamma, alpha, beta, llr"),

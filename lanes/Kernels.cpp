@@ -3,6 +3,7 @@
 
 #include "Pass.h"
 #include "Transpose.h"
+#include "rules/Schedule.h"
 
 namespace MORVIK_LANES {
 namespace {
@@ -75,13 +76,15 @@ struct Shape {
     static void runPasses(const lanes::Workspace& workspace, unsigned from, unsigned to)
     {
         for (unsigned h = from; h < to; ++h) {
-            const unsigned d = h % 2 == 0 ? 1 : 0;
+            const unsigned d = morvik::rules::constituentOf(h);
             const lanes::ConstituentRows& other = workspace.constituent[1 - d];
             const std::int16_t* joint = h == 0 ? other.systematic : other.joint;
             if (h + 1 < to) {
-                runPass<RuleOf, count, vectors, abreast, scaled, false>(workspace, d, joint, h < 2);
+                runPass<RuleOf, count, vectors, abreast, scaled, false>(
+                    workspace, d, joint, morvik::rules::isFirstPass(h));
             } else {
-                runPass<RuleOf, count, vectors, abreast, scaled, true>(workspace, d, joint, h < 2);
+                runPass<RuleOf, count, vectors, abreast, scaled, true>(
+                    workspace, d, joint, morvik::rules::isFirstPass(h));
             }
         }
     }

@@ -7,6 +7,8 @@
 #include "Bounds.h"
 #include "InstructionSets.h"
 #include "Unaligned.h"
+#include "rules/Interleaver.h"
+#include "rules/Schedule.h"
 #include "rules/Trellis.h"
 
 namespace lanes {
@@ -75,25 +77,34 @@ LaneDecoder::LaneDecoder(const InstructionSet& instructionSet, Algorithm algorit
 {
 }
 
-void LaneDecoder::setBlockCut(BlockCut cut)
+void LaneDecoder::setCut(const Cut& cut)
 {
-    std::vector<unsigned> inverse(cut.blockSize);
-    for (unsigned i = 0; i < cut.blockSize; ++i) {
-        inverse[cut.permutation[i]] = i;
+    std::vector<unsigned> windowStart;
+    for (unsigned row = 0; row <= cut.rows(); ++row) {
+        windowStart.push_back(cut.windowStart(row));
     }
+    std::vector<unsigned> permutation(cut.K());
+    std::vector<unsigned> inverse(cut.K());
+    morvik::rules::InterleaverAddress address(*standard::findBlockSize(cut.K()));
+    for (unsigned i = 0; i < cut.K(); ++i) {
+        permutation[i] = address.next();
+        inverse[permutation[i]] = i;
+    }
+    itsWindowStart = std::move(windowStart);
+    itsPermutation = std::move(permutation);
     itsInverse = std::move(inverse);
-    itsCut = std::move(cut);
+    itsCut = cut;
     itsBlocks = 0;
 }
 
 unsigned LaneDecoder::steps() const
 {
-    return itsCut.blockSize / itsCut.segments;
+    return itsCut.segmentLength();
 }
 
 unsigned LaneDecoder::blocksTaken(unsigned blocks) const
 {
-    return std::min(blocks, kernelFor(itsInstructionSet, itsCut.segments, blocks).lanes / itsCut.segments);
+    return std::min(blocks, kernelFor(itsInstructionSet, itsCut.segments(), blocks).lanes / itsCut.segments());
 }
 
 void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
@@ -107,24 +118,24 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
     for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
         work.laneStart[lane] = {order.block(lane), order.segment(lane) * steps()};
         work.firstLanes[lane] = order.segment(lane) == 0 ? -1 : 0;
-        work.lastLanes[lane] = order.segment(lane) == itsCut.segments - 1 ? -1 : 0;
+        work.lastLanes[lane] = order.segment(lane) == itsCut.segments() - 1 ? -1 : 0;
     }
     prepareInterleaver(kernel, work.interleaver[0], itsInverse);
-    prepareInterleaver(kernel, work.interleaver[1], itsCut.permutation);
+    prepareInterleaver(kernel, work.interleaver[1], itsPermutation);
     preparePermutation(kernel, work.before, 0, 0, [&](unsigned segment) { return segment - 1; });
     preparePermutation(kernel, work.after, 0, 0, [&](unsigned segment) { return segment + 1; });
-    work.blockSize = itsCut.blockSize;
+    work.blockSize = itsCut.K();
 }
 
 std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char* base) const
 {
     const std::size_t row = kernel.lanes;
     const std::size_t rows = steps() * row;
-    const std::size_t windows = itsCut.windowStart.size() - 1;
+    const unsigned windows = itsCut.rows();
     Layout layout(base);
     Workspace& space = work.space;
     space.steps = steps();
-    space.windows = static_cast<unsigned>(windows);
+    space.windows = windows;
     space.corrections = itsCorrections.data();
     for (const unsigned d : {0U, 1U}) {
         work.interleaver[d] = takePermutations(kernel, layout, steps());
@@ -133,7 +144,7 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
                                 layout.take<std::int16_t>(rows),
                                 {work.interleaver[d].sources, work.interleaver[d].controls},
                                 layout.take<std::int16_t>(states * row),
-                                layout.take<std::int16_t>(windows * states * row),
+                                layout.take<std::int16_t>(std::size_t{windows} * states * row),
                                 layout.take<std::int16_t>(states * row),
                                 layout.take<std::int16_t>(states * row)};
     }
@@ -173,7 +184,7 @@ void LaneDecoder::preparePermutation(
 {
     const LaneOrder order = laneOrder(kernel);
     const auto sourceLane = [&](unsigned lane) {
-        return order.lane(order.block(lane), sourceOf(order.segment(lane)) % itsCut.segments);
+        return order.lane(order.block(lane), sourceOf(order.segment(lane)) % itsCut.segments());
     };
     const unsigned vectorLanes = kernel.vectorLanes;
     for (unsigned v = 0; v < kernel.lanes / vectorLanes; ++v) {
@@ -194,22 +205,22 @@ void LaneDecoder::preparePermutation(
 
 LaneOrder LaneDecoder::laneOrder(const Kernel& kernel) const
 {
-    return {itsCut.segments, kernel.groupLanes, kernel.vectorLanes};
+    return {itsCut.segments(), kernel.groupLanes, kernel.vectorLanes};
 }
 
 template <class Input>
 bool LaneDecoder::load(const Streams<Input>* blocks, unsigned count)
 {
-    const Kernel& kernel = kernelFor(itsInstructionSet, itsCut.segments, count);
+    const Kernel& kernel = kernelFor(itsInstructionSet, itsCut.segments(), count);
     Work& work = itsWork[static_cast<std::size_t>(&kernel - itsInstructionSet.kernels)];
-    if (work.blockSize != itsCut.blockSize) {
+    if (work.blockSize != itsCut.K()) {
         prepareWork(kernel, work);
     }
     itsTails.resize(blocksTaken(count));
     itsKernel = &kernel;
     itsCurrent = &work;
     itsBlocks = blocksTaken(count);
-    work.space.windowStart = itsCut.windowStart.data();  // of the cut as it is now
+    work.space.windowStart = itsWindowStart.data();  // of the cut as it is now
     ConstituentRows* const rows = work.space.constituent;
     bool within = loadStream(blocks, &Streams<Input>::systematic, 0, rows[0].systematic);
     within = loadStream(blocks, &Streams<Input>::parity1, 1, rows[0].parity) && within;
@@ -234,7 +245,7 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
     bool within = loadRows(*itsKernel, lanes, steps(), rows);
     for (unsigned block = 0; block < itsBlocks; ++block) {
         for (unsigned position = 0; position < tailPositions; ++position) {
-            const auto value = int{valueAt(blocks[block].*stream, std::size_t{itsCut.blockSize} + position)};
+            const auto value = int{valueAt(blocks[block].*stream, std::size_t{itsCut.K()} + position)};
             itsTails[block][3 * position + s] = value;
             within = within && value >= branchMin && value <= branchMax;
         }
@@ -255,7 +266,7 @@ void LaneDecoder::decode(unsigned from, unsigned to)
         prepareStarts(1);
     }
     itsKernel->decode(itsCurrent->space, itsAlgorithm, from, to);
-    itsLastDecoder = to % 2;
+    itsLastDecoder = morvik::rules::constituentOf(to - 1);
 }
 
 /// Before the first passes the state is known at a block's ends alone (rules 10, 19, 20).
@@ -271,9 +282,9 @@ void LaneDecoder::prepareStarts(unsigned d)
     std::fill_n(space.constituent[d].alphaReached, states * row, std::int16_t{0});
     std::fill_n(space.constituent[d].betaReached, states * row, std::int16_t{0});
     const LaneOrder order = laneOrder(*itsKernel);
-    for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments; ++block) {
+    for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments(); ++block) {
         const unsigned first = order.lane(block, 0);
-        const unsigned last = order.lane(block, itsCut.segments - 1);
+        const unsigned last = order.lane(block, itsCut.segments() - 1);
         const std::array<int, 12>& t = itsTails[presentBlock(block)];
         const unsigned o = 6 * d;
         const auto metrics =
@@ -323,8 +334,8 @@ LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
     const std::int16_t* const sources[3] = {rows[0].systematic, rows[0].parity, rows[1].parity};
     for (unsigned s = 0; s < 3; ++s) {
         std::vector<std::int16_t>& values = streams[s];
-        values.reserve(itsCut.blockSize + tailPositions);
-        for (unsigned segment = 0; segment < itsCut.segments; ++segment) {
+        values.reserve(itsCut.K() + tailPositions);
+        for (unsigned segment = 0; segment < itsCut.segments(); ++segment) {
             const unsigned lane = order.lane(block, segment);
             for (unsigned k = 0; k < steps(); ++k) {
                 values.push_back(sources[s][(lane / vectorLanes * steps() + k) * vectorLanes + lane % vectorLanes]);

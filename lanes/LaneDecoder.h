@@ -10,16 +10,11 @@
 
 #include "Kernels.h"
 #include "LaneOrder.h"
+#include "rules/Cut.h"
 
 namespace lanes {
 
-/// How the blocks of a size are cut and permuted.
-struct BlockCut {
-    unsigned blockSize = 0;             ///< K, at most 6144
-    unsigned segments = 0;              ///< a power of two, at most 32, of 8 to 768 steps each
-    std::vector<unsigned> windowStart;  ///< the first step of each window of a segment, then the segment's end
-    std::vector<unsigned> permutation;  ///< K: position i of the interleaved order is position [i] of the natural one
-};
+using morvik::rules::Cut;
 
 /// Positions of a block that carry its tail, behind K others.
 constexpr unsigned tailPositions = 4;
@@ -46,15 +41,16 @@ struct RowPermutations {
     std::uint8_t* controls;
 };
 
-/// Use: setBlockCut whenever the size changes; then, for some blocks, load, decode and fetch results.
+/// Use: setCut whenever the size changes; then, for some blocks, load, decode and fetch results.
 class LaneDecoder {
 public:
     LaneDecoder(const InstructionSet& instructionSet, Algorithm algorithm, const CorrectionTable& corrections);
 
-    /// One decoder cuts all blocks of a size alike: what was prepared for a size is taken up again.
-    void setBlockCut(BlockCut cut);
+    /// Of a block size of the standard, at most 32 segments. One decoder cuts all blocks of a size alike: what was
+    /// prepared for a size is taken up again.
+    void setCut(const Cut& cut);
 
-    const BlockCut& blockCut() const
+    const Cut& cut() const
     {
         return itsCut;
     }
@@ -131,9 +127,11 @@ private:
     const InstructionSet& itsInstructionSet;
     const Algorithm itsAlgorithm;
     const CorrectionTable itsCorrections;
-    BlockCut itsCut;
-    std::vector<unsigned> itsInverse;  ///< of the cut's permutation
-    std::vector<Work> itsWork;         ///< one for each kernel
+    Cut itsCut;
+    std::vector<unsigned> itsWindowStart;  ///< the first step of each window of a segment, then the segment's end
+    std::vector<unsigned> itsPermutation;  ///< position i of the interleaved order is position [i] of the natural one
+    std::vector<unsigned> itsInverse;
+    std::vector<Work> itsWork;  ///< one for each kernel
     const Kernel* itsKernel = nullptr;
     Work* itsCurrent = nullptr;
     unsigned itsBlocks = 0;                     ///< that are loaded

@@ -6,7 +6,7 @@
 #include <string>
 
 #include "BitMatrix.h"
-#include "rules/BlockSizes.h"
+#include "rules/Interleaver.h"
 
 namespace morvik::link {
 
@@ -23,8 +23,9 @@ std::vector<std::uint16_t> permutation(unsigned K)
     }
     std::vector<std::uint16_t> positions;
     positions.reserve(K);
-    for (std::uint64_t i = 0; i < K; ++i) {
-        positions.push_back(static_cast<std::uint16_t>((row->f1 * i + row->f2 * i * i) % K));
+    rules::InterleaverAddress address(*row);
+    for (unsigned i = 0; i < K; ++i) {
+        positions.push_back(static_cast<std::uint16_t>(address.next()));
     }
     return positions;
 }

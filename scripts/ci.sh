@@ -168,7 +168,7 @@ stage_starts() {
     scripts/build coverage TNumberFormat_test
     build/coverage/tests/TNumberFormat_test --gtest_brief=1
     count_lines src/TNumberFormat.cpp
-    scripts/mutate --only src/Segmentation.cpp:23 --every 10 --anew
+    scripts/mutate --only rules/Cut.h:23 --every 10 --anew
     scripts/packages x86_64
     scripts/validate --tables
     scripts/renew-results

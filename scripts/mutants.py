@@ -9,18 +9,20 @@ ROOT = pathlib.Path(__file__).resolve().parent.parent
 # Where to mutate: files, and the named functions in them, or all.
 PLACES = {
     "rules/Arithmetic.h": None,
+    "rules/BlockSizes.h": ["findBlockSize"],
+    "rules/Cut.h": None,
+    "rules/Interleaver.h": None,
+    "rules/Schedule.h": None,
+    "rules/Tail.h": None,
     "rules/Trellis.h": None,
     "rules/TrellisDecision.h": None,
-    "src/Segmentation.cpp": None,
     "src/TCalculationEngineModBase.cpp": ["lutEntry", "forward", "backward", "ratios", "mod_gamma", "createLUT"],
     "src/TDecoder3G.cpp": ["intrinsicValue", "scaled", "extract", "appendParity", "interleaveSystematic",
                            "preparePermutation", "permutation", "calcSISO", "startExtrinsic", "calcIntrinsic",
                            "calcGamma", "calcAlpha", "calcBeta", "calcLLR", "calcExtrinsic", "setInitialState",
                            "hardDecisions"],
-    "src/TDecoder3G.h": ["constituent"],
     "src/TDecoder3GPU.cpp": ["border", "allocate", "buildSegments", "calcGamma", "calcAlpha", "initialiseAlpha",
                              "calcBeta", "initialiseBeta", "runWindow", "windowStartingWhereEnds", "preCalcBetaTail"],
-    "src/TInterleaver3GPPLTE.cpp": ["calcInterleaver"],
     "src/TNumberFormat.cpp": ["halfRange", "TNumberFormat", "place", "integer", "real"],
     "src/SimulationCall.cpp": ["inputInteger", "reportSaturation", "convert", "truncateTag", "withSoftValues",
                                "decodeByComponents", "countByComponents", "lanesTake", "loadLanes"],
@@ -37,7 +39,6 @@ PLACES = {
     "lanes/Rules.h": None,
     "lanes/Transpose.h": None,
     "lanes/Words.h": None,
-    "rules/BlockSizes.h": ["findBlockSize"],
 }
 
 # Replacements: operators with a space on both sides or at the end of their line, and words.
@@ -63,9 +64,9 @@ EQUIVALENT = {
          [("Metric, 4> pair", "Metric, 5> pair"), ("Metric one[2]", "Metric one[3]"), ("Metric zero[2]", "Metric zero[3]"),
           ("Wide x[3]", "Wide x[4]"), ("Wide p[3]", "Wide p[4]"), ("Wide q[3]", "Wide q[4]")]),
     ],
-    "src/Segmentation.cpp": [
-        ("127 and 128 steps are halved to 64 as well",
-         [("rest >= 128", "rest >= 129"), ("rest >= 128", "rest >= 127"), ("rest >= 128", "rest > 128")]),
+    "rules/Cut.h": [
+        ("64 to 127 steps have no full row in front of their rest",
+         [("itsLength < longestWindow ?", "itsLength <= longestWindow ?")]),
     ],
     "src/TCalculationEngineModBase.cpp": [
         ("eight points resolve log2 8 - 3 = 0 fraction bits, as fewer do", [("log2Range > 2 ?", "log2Range > 3 ?")]),
@@ -82,10 +83,6 @@ EQUIVALENT = {
              "unsigned i = 1; i + 1 < starts.size()", "unsigned i = 0; i + 2 < starts.size()",
              "unsigned i = 0; i + 0 < starts.size()", "unsigned i = 0; i - 1 < starts.size()",
              "unsigned i = 0; i + 1 <= starts.size()")]),
-    ],
-    "src/TInterleaver3GPPLTE.cpp": [
-        ("no step of a permutation is 0, and only its first position",
-         [("position >= K", "position > K"), ("step >= K", "step > K")]),
     ],
     "src/TNumberFormat.cpp": [
         ("a value that equals the limit becomes the limit",

@@ -6,8 +6,8 @@
 #include <typeinfo>
 #include <utility>
 
-#include "Segmentation.h"
 #include "TCalculationEngineModBase.h"
+#include "rules/Cut.h"
 
 namespace {
 
@@ -174,17 +174,12 @@ bool LanePath::keepsTheirTables(unsigned K)
 /// Makes everything ready for blocks of K bits.
 void LanePath::prepare(unsigned K)
 {
-    const unsigned lastK = itsLanes->blockCut().blockSize;
+    const unsigned lastK = itsLanes->cut().K();
     if (K < lastK) {
         keepLast();
     }
     if (K != lastK) {
-        lanes::BlockCut cut;
-        cut.blockSize = K;
-        cut.segments = segmentation::segmentCount(K, std::uint64_t{itsDecoder.itsNumPU} * itsDecoder.itsThreadsPerPU);
-        cut.windowStart = segmentation::windowStarts(K / cut.segments);
-        itsDecoder.itsInterleaver->calcInterleaver(cut.permutation, K);
-        itsLanes->setBlockCut(std::move(cut));
+        itsLanes->setCut(morvik::rules::Cut(K, itsDecoder.itsNumPU, itsDecoder.itsThreadsPerPU));
         itsIterations = 0;
     }
     while (!itsPast.empty() && itsPast.back().K <= K) {
@@ -224,7 +219,7 @@ void LanePath::ratios(std::int16_t* const* blocks)
 void LanePath::keepLast()
 {
     if (itsIterations != 0) {
-        itsPast.push_back({itsLanes->loadedBlock(itsLoaded - 1), itsLanes->blockCut().blockSize, itsIterations});
+        itsPast.push_back({itsLanes->loadedBlock(itsLoaded - 1), itsLanes->cut().K(), itsIterations});
         itsIterations = 0;
     }
 }

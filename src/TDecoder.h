@@ -12,6 +12,7 @@
 #include "TCalculationEngine.h"
 #include "TInterleaver.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
+#include "rules/Tail.h"
 
 /// A turbo decoder works on one code block at a time. The trellis of a block of K bits has
 /// N = K + 3 steps, the last three being the termination tail. A half-iteration is one
@@ -77,7 +78,7 @@ public:
 
 protected:
     /// Steps of the termination tail: one for each delay element of the encoder.
-    static constexpr unsigned tailSteps = 3;
+    static constexpr unsigned tailSteps = morvik::rules::tailSteps;
 
     TDecoder() = default;
     TDecoder(const TDecoder&) = delete;

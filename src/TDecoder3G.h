@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "TDecoder.h"
+#include "rules/Schedule.h"
 
 /// Separates the input streams, runs the half-iterations of the two constituent decoders in turn
 /// and makes the hard decisions. Constituent decoder 0 works in natural order, 1 in interleaved
@@ -64,7 +65,7 @@ protected:
     /// The constituent decoder that half-iteration h belongs to.
     static unsigned constituent(unsigned int h)
     {
-        return h % 2 == 0 ? 1 : 0;
+        return morvik::rules::constituentOf(h);
     }
 
     /// One kernel over the trellis steps j to k; backward from j down to k. The start column of a

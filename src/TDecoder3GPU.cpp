@@ -7,14 +7,16 @@
 #include <utility>
 
 #include "Messages.h"
-#include "Segmentation.h"
 #include "rules/Arithmetic.h"
+#include "rules/Cut.h"
+#include "rules/Schedule.h"
 #include "rules/Trellis.h"
+
+namespace rules = morvik::rules;
 
 namespace {
 
 constexpr std::uint32_t defaultUnits = 4;
-constexpr std::uint32_t defaultThreads = 4;
 constexpr std::uint32_t traceSegments = 1;  ///< above this level, the segmentation is traced
 constexpr std::uint32_t traceColumns = 8;   ///< above this level, every border column is traced
 
@@ -79,7 +81,7 @@ TDecoder3GPU::TDecoder3GPU(bool layout3GPP2, std::uint32_t numPU, std::uint32_t 
 TDecoder* TDecoder3GPU::create(bool layout3GPP2, const std::string& properties)
 {
     std::uint32_t units = defaultUnits;
-    std::uint32_t threads = defaultThreads;
+    std::uint32_t threads = rules::threadsOfUnit;
     if (!properties.empty()) {
         std::istringstream numbers(properties);
         numbers.imbue(std::locale::classic());
@@ -99,7 +101,7 @@ TDecoder* TDecoder3GPU::create(bool layout3GPP2, const std::string& properties)
 std::string TDecoder3GPU::getProperties() const
 {
     const std::string units = (is3GPP2 ? "3GPP2PU:" : "3GPPPU:") + std::to_string(itsNumPU);
-    return itsThreadsPerPU == defaultThreads ? units : units + "," + std::to_string(itsThreadsPerPU);
+    return itsThreadsPerPU == rules::threadsOfUnit ? units : units + "," + std::to_string(itsThreadsPerPU);
 }
 
 bool TDecoder3GPU::allocate(unsigned int blockSize)
@@ -123,26 +125,23 @@ bool TDecoder3GPU::buildSegments(std::uint32_t K)
 {
     itsAlphaSegment.clear();
     itsBetaSegment.clear();
-    itsNT = segmentation::segmentCount(K, std::uint64_t{itsNumPU} * itsThreadsPerPU);
+    const rules::Cut cut(K, itsNumPU, itsThreadsPerPU);
+    itsNT = cut.segments();
     if (itsTraceLevel > 0) {
         messages::writeLine(messages::output(), "itsNT=", itsNT);
     }
-    const std::uint32_t length = K / itsNT;
-    if (K != itsNT * length) {
+    if (!cut.dividesEvenly()) {
         messages::writeError("ERROR:TDecoder3GPU:Block size not supported");
         return false;
     }
     std::vector<ABSegment> segments;
     for (std::uint32_t u = 0; u < itsNT; ++u) {
-        segments.push_back({u * length, (u + 1) * length});
+        segments.push_back({u * cut.segmentLength(), (u + 1) * cut.segmentLength()});
     }
     std::vector<ABSegment> windows;
-    const std::vector<std::uint32_t> starts = segmentation::windowStarts(length);
-    for (std::size_t row = 0; row + 1 < starts.size(); ++row) {
-        for (std::uint32_t u = 0; u < itsNT; ++u) {
-            const std::uint32_t first = u * length + starts[row];
-            windows.push_back({u * length + starts[row + 1] - 1, first == 0 ? 0 : first - 1});
-        }
+    for (std::uint32_t i = 0; i < cut.windows(); ++i) {
+        const rules::Window window = cut.window(i);
+        windows.push_back({window.last, window.first == 0 ? 0 : window.first - 1});
     }
     itsAlphaSegment = std::move(segments);
     itsBetaSegment = std::move(windows);
@@ -166,7 +165,7 @@ bool TDecoder3GPU::calcAlpha(unsigned int h)
     if (traced) {
         messages::writeLine(messages::output(), "TDecoder3GPU::calcAlpha(", h, ")");
     }
-    if (h < 2) {
+    if (rules::isFirstPass(h)) {
         initialiseAlpha(h);
     }
     T8 reached = starts[0];
@@ -206,7 +205,7 @@ bool TDecoder3GPU::calcBeta(unsigned int h)
     if (traced) {
         messages::writeLine(messages::output(), "TDecoder3GPU::calcBeta(", h, ")");
     }
-    if (h < 2) {
+    if (rules::isFirstPass(h)) {
         initialiseBeta(h);
     }
     // The units hold one start column for each segment and fetch the next row's while they work on
@@ -215,7 +214,7 @@ bool TDecoder3GPU::calcBeta(unsigned int h)
     row.resize(itsNT);
     for (std::size_t i = 0; i < starts.size(); ++i) {
         T8& held = row[i % itsNT];
-        const T8 start = h < 2 && i + 1 < starts.size() ? T8{} : held;
+        const T8 start = rules::isFirstPass(h) && i + 1 < starts.size() ? T8{} : held;
         if (i + itsNT < starts.size()) {
             held = starts[i + itsNT];
         }
@@ -268,8 +267,7 @@ bool TDecoder3GPU::runWindow(unsigned int h, std::size_t i, const T8& start)
 
 std::size_t TDecoder3GPU::windowStartingWhereEnds(std::size_t i) const
 {
-    const std::size_t windows = itsBetaSegment.size();
-    return i >= itsNT ? i - itsNT : windows - itsNT + i - 1;
+    return rules::windowBefore<std::size_t>(i, itsNT, itsBetaSegment.size());
 }
 
 bool TDecoder3GPU::preCalcAlpha(unsigned int, unsigned int, T8* column)

@@ -4,7 +4,6 @@
 #include <memory>
 #include <stdexcept>
 
-#include "TDecoder3GPU.h"
 #include "TInterleaver.h"
 #include "TNumberFormat.h"
 #include "rules/BlockSizes.h"
@@ -12,28 +11,6 @@
 namespace morvik {
 
 namespace {
-
-UnitLayout divided(std::uint32_t K, int numPu)
-{
-    const std::unique_ptr<TDecoder> made(TDecoder::create("3GPPPU:" + std::to_string(numPu)));
-    auto* const decoder = dynamic_cast<TDecoder3GPU*>(made.get());
-    if (decoder == nullptr || !decoder->allocate(K + tailSteps)) {
-        throw std::runtime_error("the decoder does not divide blocks of " + std::to_string(K) + " bits");
-    }
-    const Division division(*decoder);
-    UnitLayout layout;
-    layout.numPu = numPu;
-    layout.threads = decoder->itsNumPU * decoder->itsThreadsPerPU;
-    layout.segments = division.segments();
-    layout.segmentLength = division.segmentLength();
-    layout.windows = division.windows();
-    for (const Window& window : layout.windows) {
-        if (window.segment == 0) {
-            layout.lengths.push_back(window.last - window.first + 1);
-        }
-    }
-    return layout;
-}
 
 NumberFormat formatOf(const std::string& what, const std::string& text)
 {
@@ -60,8 +37,8 @@ BlockLayout layoutOf(std::uint32_t K)
     layout.f2 = size->f2;
     const std::unique_ptr<TInterleaver> interleaver(TInterleaver::create("3GPPLTE"));
     interleaver->calcInterleaver(layout.interleaver, K);
-    for (const int numPu : {2, 4, 8}) {
-        layout.divisions.push_back(divided(K, numPu));
+    for (const unsigned units : {2U, 4U, 8U}) {
+        layout.cuts.emplace_back(K, units);
     }
     return layout;
 }

@@ -6,26 +6,16 @@
 #include <string>
 #include <vector>
 
-#include "hardware/testbench/Division.h"
+#include "rules/Cut.h"
 
 namespace morvik {
-
-/// How a number of processing units divides a block.
-struct UnitLayout {
-    int numPu = 0;
-    unsigned threads = 0;
-    unsigned segments = 0;
-    std::uint32_t segmentLength = 0;     ///< trellis steps
-    std::vector<std::uint32_t> lengths;  ///< of a segment's windows, in their order in the segment: one for each row
-    std::vector<Window> windows;         ///< in the order in which they are computed
-};
 
 struct BlockLayout {
     std::uint32_t K = 0;
     std::uint32_t f1 = 0;
     std::uint32_t f2 = 0;
     std::vector<unsigned> interleaver;  ///< entry i is the bit that the second encoder takes as its i-th one
-    std::vector<UnitLayout> divisions;  ///< for 2, 4 and 8 units
+    std::vector<rules::Cut> cuts;       ///< for 2, 4 and 8 units
 };
 
 /// Of a block size; throws std::invalid_argument for another K.

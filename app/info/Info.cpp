@@ -17,6 +17,7 @@
 #include "Notice.h"
 #include "report/Plot.h"
 #include "rules/BlockSizes.h"
+#include "rules/Tail.h"
 #include "simulation/Point.h"
 
 namespace morvik {
@@ -30,16 +31,16 @@ struct Options {
     std::string plot;
 };
 
-std::string lengthsText(const UnitLayout& division)
+std::string lengthsText(const rules::Cut& cut)
 {
     std::string text;
-    for (std::size_t row = 0; row < division.lengths.size();) {
-        std::size_t end = row;
-        while (end < division.lengths.size() && division.lengths[end] == division.lengths[row]) {
+    for (unsigned row = 0; row < cut.rows();) {
+        unsigned end = row;
+        while (end < cut.rows() && cut.windowLength(end) == cut.windowLength(row)) {
             ++end;
         }
         text += (row == 0 ? "" : ", ") + (end - row > 1 ? std::to_string(end - row) + " x " : "") +
-                std::to_string(division.lengths[row]);
+                std::to_string(cut.windowLength(row));
         row = end;
     }
     return text;
@@ -48,22 +49,23 @@ std::string lengthsText(const UnitLayout& division)
 std::string textOf(const BlockLayout& layout)
 {
     const std::string K = std::to_string(layout.K);
-    std::string text = "K = " + K + ": " + std::to_string(layout.K + 4) + " rows of three soft values, " +
-                       std::to_string(layout.K + 3) + " trellis steps\nInterleaver: f1 = " + std::to_string(layout.f1) +
+    std::string text = "K = " + K + ": " + std::to_string(layout.K + rules::tailPositions) +
+                       " rows of three soft values, " + std::to_string(layout.K + rules::tailSteps) +
+                       " trellis steps\nInterleaver: f1 = " + std::to_string(layout.f1) +
                        ", f2 = " + std::to_string(layout.f2) + "; the second encoder's bit i is bit (" +
                        std::to_string(layout.f1) + " i + " + std::to_string(layout.f2) + " i^2) mod " + K +
                        "\n\nunits  threads  segments  steps of each  rows  steps of the windows\n";
-    for (const UnitLayout& division : layout.divisions) {
+    for (const rules::Cut& cut : layout.cuts) {
         char line[80];
         std::snprintf(line,
                       sizeof line,
-                      "%5d %8u %9u %14u %5zu  ",
-                      division.numPu,
-                      division.threads,
-                      division.segments,
-                      division.segmentLength,
-                      division.lengths.size());
-        text += line + lengthsText(division) + '\n';
+                      "%5u %8u %9u %14u %5u  ",
+                      cut.units(),
+                      cut.units() * rules::threadsOfUnit,
+                      cut.segments(),
+                      cut.segmentLength(),
+                      cut.rows());
+        text += line + lengthsText(cut) + '\n';
     }
     return text;
 }
@@ -117,19 +119,24 @@ std::string tableText(const BlockLayout& layout)
 
 using Json = nlohmann::ordered_json;
 
-Json jsonOf(const UnitLayout& division)
+Json jsonOf(const rules::Cut& cut)
 {
+    Json lengths = Json::array();
+    for (unsigned row = 0; row < cut.rows(); ++row) {
+        lengths.push_back(cut.windowLength(row));
+    }
     Json windows = Json::array();
-    for (const Window& window : division.windows) {
+    for (unsigned number = 0; number < cut.windows(); ++number) {
+        const rules::Window window = cut.window(number);
         windows.push_back(
             {{"segment", window.segment}, {"row", window.row}, {"first", window.first}, {"last", window.last}});
     }
-    return {{"num_pu", division.numPu},
-            {"threads", division.threads},
-            {"segments", division.segments},
-            {"segment_length", division.segmentLength},
-            {"rows", division.lengths.size()},
-            {"window_lengths", division.lengths},
+    return {{"num_pu", cut.units()},
+            {"threads", cut.units() * rules::threadsOfUnit},
+            {"segments", cut.segments()},
+            {"segment_length", cut.segmentLength()},
+            {"rows", cut.rows()},
+            {"window_lengths", lengths},
             {"windows", windows}};
 }
 
@@ -152,11 +159,11 @@ Json jsonOf(const BlockLayout& layout, bool table)
     Json object = {{"block_size", layout.K},
                    {"f1", layout.f1},
                    {"f2", layout.f2},
-                   {"soft_value_rows", layout.K + 4},
-                   {"trellis_steps", layout.K + 3},
+                   {"soft_value_rows", layout.K + rules::tailPositions},
+                   {"trellis_steps", layout.K + rules::tailSteps},
                    {"divisions", Json::array()}};
-    for (const UnitLayout& division : layout.divisions) {
-        object["divisions"].push_back(jsonOf(division));
+    for (const rules::Cut& cut : layout.cuts) {
+        object["divisions"].push_back(jsonOf(cut));
     }
     if (table) {
         object["interleaver"] = layout.interleaver;

@@ -27,23 +27,23 @@ constexpr const char* backwardInk = "#b5541c";
 /// Unit counts that divide a block alike.
 struct Panel {
     std::string units;
-    const UnitLayout* division;
+    const rules::Cut* cut;
 
     double height() const
     {
-        return headingHeight + segmentHeight * division->segments + arrowsHeight;
+        return headingHeight + segmentHeight * cut->segments() + arrowsHeight;
     }
 };
 
 std::vector<Panel> panelsOf(const BlockLayout& layout)
 {
     std::vector<Panel> panels;
-    for (const UnitLayout& division : layout.divisions) {
-        const std::string units = std::to_string(division.numPu);
-        if (!panels.empty() && panels.back().division->segments == division.segments) {
+    for (const rules::Cut& cut : layout.cuts) {
+        const std::string units = std::to_string(cut.units());
+        if (!panels.empty() && panels.back().cut->segments() == cut.segments()) {
             panels.back().units += ", " + units;
         } else {
-            panels.push_back({units, &division});
+            panels.push_back({units, &cut});
         }
     }
     return panels;
@@ -55,9 +55,9 @@ std::string counted(std::size_t count, const std::string& noun)
 }
 
 /// From dark to light over the rows, of which two are far apart.
-std::string shadeOf(std::size_t row, std::size_t rows)
+std::string shadeOf(unsigned row, unsigned rows)
 {
-    const double lightness = rows > 1 ? static_cast<double>(row) / static_cast<double>(rows - 1) : 0;
+    const double lightness = rows > 1 ? double{row} / (rows - 1) : 0;
     const int dark[] = {0x1f, 0x5f, 0x99};
     const int light[] = {0xc6, 0xdd, 0xf1};
     unsigned shade[3];
@@ -72,51 +72,47 @@ std::string shadeOf(std::size_t row, std::size_t rows)
 /// One panel, whose segments begin at the height `top`.
 class Painter {
 public:
-    Painter(const UnitLayout& division, double top, Drawing& drawing)
-        : itsDivision(division), itsTop(top), itsDrawing(drawing)
-    {
-    }
+    Painter(const rules::Cut& cut, double top, Drawing& drawing) : itsCut(cut), itsTop(top), itsDrawing(drawing) {}
 
     void paint()
     {
         paintSegmentNames();
-        for (std::size_t i = 0; i < itsDivision.windows.size(); ++i) {
+        for (unsigned i = 0; i < itsCut.windows(); ++i) {
             paintWindow(i);
         }
-        paintArrows(itsTop + segmentHeight * itsDivision.segments + 14);
+        paintArrows(itsTop + segmentHeight * itsCut.segments() + 14);
     }
 
 private:
     /// Of a step within its segment.
     double across(std::uint32_t step) const
     {
-        return left + (right - left) * step / itsDivision.segmentLength;
+        return left + (right - left) * step / itsCut.segmentLength();
     }
 
     void paintSegmentNames()
     {
-        for (unsigned segment = 0; segment < itsDivision.segments; ++segment) {
-            const std::uint32_t first = segment * itsDivision.segmentLength;
+        for (unsigned segment = 0; segment < itsCut.segments(); ++segment) {
+            const std::uint32_t first = segment * itsCut.segmentLength();
             itsDrawing.text(left - 10,
                             itsTop + segmentHeight * (segment + 0.5),
                             "segment " + std::to_string(segment) + ": steps " + std::to_string(first) + " to " +
-                                std::to_string(first + itsDivision.segmentLength - 1),
+                                std::to_string(first + itsCut.segmentLength() - 1),
                             10,
                             Anchor::right,
                             ink);
         }
     }
 
-    void paintWindow(std::size_t number)
+    void paintWindow(unsigned number)
     {
-        const Window& window = itsDivision.windows[number];
-        const std::uint32_t begin = window.segment * itsDivision.segmentLength;
+        const rules::Window window = itsCut.window(number);
+        const std::uint32_t begin = window.segment * itsCut.segmentLength();
         const double from = across(window.first - begin);
         const double to = across(window.last + 1 - begin);
         const double y = itsTop + segmentHeight * window.segment;
-        itsDrawing.rectangle(
-            from + 0.5, y + 0.5, to - from - 1, segmentHeight - 1, shadeOf(window.row, itsDivision.lengths.size()));
-        const bool isDark = itsDivision.lengths.size() == 1 || 2 * window.row + 1 < itsDivision.lengths.size();
+        itsDrawing.rectangle(from + 0.5, y + 0.5, to - from - 1, segmentHeight - 1, shadeOf(window.row, itsCut.rows()));
+        const bool isDark = itsCut.rows() == 1 || 2 * window.row + 1 < itsCut.rows();
         itsDrawing.text((from + to) / 2,
                         y + segmentHeight / 2,
                         std::to_string(number),
@@ -130,34 +126,32 @@ private:
         itsDrawing.text(left - 10, y, "forward", 10, Anchor::right, ink);
         itsDrawing.arrow(left + 2, y, right - 2, y, ink);
         itsDrawing.text(left - 10, y + 14, "backward", 10, Anchor::right, backwardInk);
-        std::uint32_t first = 0;
-        for (std::size_t row = 0; row < itsDivision.lengths.size(); ++row) {
-            const std::uint32_t end = first + itsDivision.lengths[row];
+        for (unsigned row = 0; row < itsCut.rows(); ++row) {
+            const std::uint32_t first = itsCut.windowStart(row);
+            const std::uint32_t end = itsCut.windowStart(row + 1);
             itsDrawing.arrow(across(end) - 2, y + 14, across(first) + 2, y + 14, backwardInk);
             const double middle = (across(first) + across(end)) / 2;
-            const std::string steps = std::to_string(itsDivision.lengths[row]) + " steps";
+            const std::string steps = std::to_string(end - first) + " steps";
             itsDrawing.text(middle, y + 26, "row " + std::to_string(row), 9, Anchor::centre, backwardInk);
             itsDrawing.text(middle, y + 38, steps, 9, Anchor::centre, backwardInk);
-            first = end;
         }
     }
 
-    const UnitLayout& itsDivision;
+    const rules::Cut& itsCut;
     double itsTop;
     Drawing& itsDrawing;
 };
 
 std::string headingOf(const Panel& panel)
 {
-    const UnitLayout& division = *panel.division;
+    const rules::Cut& cut = *panel.cut;
     std::string units = panel.units;
     const std::size_t last = units.rfind(", ");
     if (last != std::string::npos) {
         units.replace(last, 2, " and ");
     }
-    return units + " units: " + counted(division.segments, "segment") + " of " +
-           counted(division.segmentLength, "trellis step") + ", " + counted(division.lengths.size(), "row") +
-           " of windows";
+    return units + " units: " + counted(cut.segments(), "segment") + " of " +
+           counted(cut.segmentLength(), "trellis step") + ", " + counted(cut.rows(), "row") + " of windows";
 }
 
 }  // namespace
@@ -177,7 +171,7 @@ report::Drawing pictureOf(const BlockLayout& layout)
     double top = titleHeight;
     for (const Panel& panel : panels) {
         drawing.text(24, top, headingOf(panel), 12, Anchor::left, faintInk);
-        Painter(*panel.division, top + headingHeight / 2, drawing).paint();
+        Painter(*panel.cut, top + headingHeight / 2, drawing).paint();
         top += panel.height();
     }
     drawing.text(24,

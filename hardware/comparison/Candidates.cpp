@@ -200,15 +200,15 @@ private:
                                  Candidate::place,
                                  [columns, first](const Sample& sample) {
                                      Place place = sample.place;
-                                     if (place.pass >= 2) {
-                                         place.pass -= 2;
+                                     if (!rules::isFirstPass(place.pass)) {
+                                         place.pass = rules::passBefore(place.pass);
                                          return columns->fit(place, sample.got);
                                      }
                                      const bool hasSystematic = stageOf(place.signal) == Stage::intrinsic;
                                      return hasSystematic ? first->fit(place, sample.got) : fitIf(sample.got == 0);
                                  }});
         const auto addStep = [&](const char* text, int distance) {
-            const unsigned K = itsModel.windows.K;
+            const unsigned K = itsModel.cut.K();
             itsCandidates.push_back(
                 {text, Candidate::descriptive, Candidate::place, [columns, distance, K](const Sample& sample) {
                      Place place = sample.place;

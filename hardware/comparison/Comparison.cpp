@@ -42,7 +42,7 @@ private:
     {
         const std::uint64_t before = itsResult.compared();
         for (const Stage stage : stages) {
-            for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
+            for (const unsigned step : stepsInOrder(itsModel.cut, stage)) {
                 compareColumn(pass, stage, step);
             }
         }
@@ -101,7 +101,7 @@ private:
         const Stage stage = stageOf(itsResult.first->signal);
         const auto [first, count] = signalsOf(stage);
         const unsigned pass = itsResult.first->pass;
-        for (const unsigned step : stepsInOrder(itsModel.windows, stage)) {
+        for (const unsigned step : stepsInOrder(itsModel.cut, stage)) {
             for (unsigned i = 0; i < count; ++i) {
                 const Place place = {pass, first + i, step};
                 if (itsDump.has(place) && !itsDump.isCopy(place.signal) &&
@@ -145,29 +145,29 @@ std::vector<InputState> columnInputs(Stage stage, unsigned pass, unsigned step)
     return {inputAt(stage, pass, step), inputAt(Stage::branch, pass, step)};
 }
 
-std::vector<InputState> forwardInputs(const Windows& windows, const Place& place)
+std::vector<InputState> forwardInputs(const rules::Cut& cut, const Place& place)
 {
     if (place.step == 0) {
         return {};
     }
-    const bool isStart = place.step < windows.K && place.step % windows.segmentLength == 0;
-    if (isStart && place.pass < 2) {
+    const bool isStart = cut.startsSegment(place.step);
+    if (isStart && rules::isFirstPass(place.pass)) {
         return {};
     }
-    return columnInputs(Stage::forward, isStart ? place.pass - 2 : place.pass, place.step - 1);
+    return columnInputs(Stage::forward, isStart ? rules::passBefore(place.pass) : place.pass, place.step - 1);
 }
 
-std::vector<InputState> backwardInputs(const Windows& windows, const Place& place)
+std::vector<InputState> backwardInputs(const rules::Cut& cut, const Place& place)
 {
-    const Window& window = windows.at(place.step);
+    const rules::Window window = cut.windowAt(place.step);
     if (place.step < window.last) {
         return columnInputs(Stage::backward, place.pass, place.step + 1);
     }
-    if (windows.isFinal(window) || place.pass < 2) {
+    if (cut.startsAtTail(window) || rules::isFirstPass(place.pass)) {
         return {};
     }
-    const bool ofThisPass = windows.rows >= 3 && window.row + 1 == windows.rows;  // rule 20
-    return columnInputs(Stage::backward, ofThisPass ? place.pass : place.pass - 2, place.step + 1);
+    const unsigned from = cut.startsFromThisPass(window) ? place.pass : rules::passBefore(place.pass);
+    return columnInputs(Stage::backward, from, place.step + 1);
 }
 
 template <std::uint64_t SignalCount::*member>
@@ -186,16 +186,16 @@ std::vector<InputState> inputsOf(const Model& model, const Place& place)
 {
     switch (stageOf(place.signal)) {
     case Stage::intrinsic:
-        if (place.pass == 0 || place.step >= model.windows.K) {
+        if (place.pass == 0 || place.step >= model.cut.K()) {
             return {};
         }
         return {inputAt(Stage::extrinsic, place.pass - 1, model.codes[codeOf(place.pass)].order[place.step])};
     case Stage::branch:
         return {inputAt(Stage::intrinsic, place.pass, place.step)};
     case Stage::forward:
-        return forwardInputs(model.windows, place);
+        return forwardInputs(model.cut, place);
     case Stage::backward:
-        return backwardInputs(model.windows, place);
+        return backwardInputs(model.cut, place);
     case Stage::ratio:
         return {inputAt(Stage::forward, place.pass, place.step),
                 inputAt(Stage::backward, place.pass, place.step),

@@ -11,23 +11,6 @@ namespace morvik::comparison {
 
 namespace {
 
-Windows windowsOf(const Division& division)
-{
-    Windows windows;
-    windows.K = division.K();
-    windows.segments = division.segments();
-    windows.segmentLength = division.segmentLength();
-    windows.inOrder = division.windows();
-    windows.rows = static_cast<unsigned>(windows.inOrder.size()) / windows.segments;
-    windows.ofStep.resize(windows.K);
-    for (unsigned number = 0; number < windows.inOrder.size(); ++number) {
-        for (unsigned step = windows.inOrder[number].first; step <= windows.inOrder[number].last; ++step) {
-            windows.ofStep[step] = number;
-        }
-    }
-    return windows;
-}
-
 void keepPass(const Passes& passes, unsigned pass, Values& values)
 {
     for (unsigned signal = 0; signal < signalCount; ++signal) {
@@ -47,7 +30,7 @@ Model computeModel(const SoftBlock& block,
                    std::ostream& warnings)
 {
     Passes passes(block, generics, warnings);
-    Values values(2 * iterations, passes.division().K() + tailSteps);
+    Values values(rules::halfIterations(iterations), passes.cut().K() + rules::tailSteps);
     for (unsigned pass = 0; pass < values.passes(); ++pass) {
         passes.next();
         keepPass(passes, pass, values);
@@ -55,8 +38,7 @@ Model computeModel(const SoftBlock& block,
     const TDecoder3GPU& core = passes.component();
     return {generics,
             std::move(values),
-            passes.division(),
-            windowsOf(passes.division()),
+            passes.cut(),
             {{{core.itsSys[0], core.itsPar0[0], core.itsInterleaver->itsPiInv},
               {core.itsSys[1], core.itsPar0[1], core.itsInterleaver->itsPi}}}};
 }
@@ -80,28 +62,27 @@ bool computesAll(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& g
     return true;
 }
 
-std::vector<unsigned> stepsInOrder(const Windows& windows, Stage stage)
+std::vector<unsigned> stepsInOrder(const rules::Cut& cut, Stage stage)
 {
     std::vector<unsigned> steps;
     if (stage == Stage::backward) {
-        for (unsigned row = 0; row < windows.rows; ++row) {
-            const Window* const each = &windows.inOrder[std::size_t{row} * windows.segments];
-            for (unsigned back = 0; back <= each->last - each->first; ++back) {
-                for (unsigned u = 0; u < windows.segments; ++u) {
-                    steps.push_back(each[u].last - back);
+        for (unsigned row = 0; row < cut.rows(); ++row) {
+            for (unsigned back = 1; back <= cut.windowLength(row); ++back) {
+                for (unsigned u = 0; u < cut.segments(); ++u) {
+                    steps.push_back(u * cut.segmentLength() + cut.windowStart(row + 1) - back);
                 }
             }
         }
         return steps;
     }
-    for (unsigned time = 0; time < windows.segmentLength; ++time) {
-        for (unsigned u = 0; u < windows.segments; ++u) {
-            steps.push_back(u * windows.segmentLength + time);
+    for (unsigned time = 0; time < cut.segmentLength(); ++time) {
+        for (unsigned u = 0; u < cut.segments(); ++u) {
+            steps.push_back(u * cut.segmentLength() + time);
         }
     }
-    const unsigned behind = stage == Stage::intrinsic ? tailSteps : stage == Stage::forward ? 1 : 0;
+    const unsigned behind = stage == Stage::intrinsic ? rules::tailSteps : stage == Stage::forward ? 1 : 0;
     for (unsigned step = 0; step < behind; ++step) {
-        steps.push_back(windows.K + step);
+        steps.push_back(cut.K() + step);
     }
     return steps;
 }

@@ -14,27 +14,6 @@
 
 namespace morvik::comparison {
 
-/// The segments and windows of a block (docs/arithmetic.md, rules 17 and 18).
-struct Windows {
-    unsigned K = 0;
-    unsigned segments = 0;
-    unsigned segmentLength = 0;
-    unsigned rows = 0;
-    std::vector<Window> inOrder;   ///< those of the division
-    std::vector<unsigned> ofStep;  ///< the window of each of the K steps
-
-    const Window& at(unsigned step) const
-    {
-        return inOrder[ofStep[step]];
-    }
-
-    /// Whether no window follows: its backward recursion starts from the tail.
-    bool isFinal(const Window& window) const
-    {
-        return window.last + 1 == K;
-    }
-};
-
 /// The streams and permutations of the two constituent codes: 0 natural, 1 interleaved. Soft values are aligned words
 /// of the state format, K + 3 of them.
 struct Code {
@@ -46,14 +25,13 @@ struct Code {
 /// Which of the two codes a half-iteration decodes.
 constexpr unsigned codeOf(unsigned pass)
 {
-    return constituentCode(pass) - 1;
+    return rules::constituentOf(pass);
 }
 
 struct Model {
     veltra_ip_morvik_v1_0_generics generics;
     Values values;  ///< those that the core computes, and no others
-    Division division;
-    Windows windows;
+    rules::Cut cut;
     std::array<Code, 2> codes;
 };
 
@@ -69,7 +47,7 @@ bool computesAll(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& g
 
 /// The steps of a stage in the order in which the core computes them: the segments at the same time, the backward
 /// recursion window by window from its end.
-std::vector<unsigned> stepsInOrder(const Windows& windows, Stage stage);
+std::vector<unsigned> stepsInOrder(const rules::Cut& cut, Stage stage);
 
 }  // namespace morvik::comparison
 

@@ -111,11 +111,6 @@ void takePending(trellis::PendingMetric<Value>& metric, const trellis::PendingMe
     metric.pending = from.pending;
 }
 
-bool startsSegment(const Windows& windows, unsigned trellisStep)
-{
-    return trellisStep < windows.K && trellisStep % windows.segmentLength == 0;
-}
-
 template <class Words>
 Words shifted(Words words, unsigned bits)
 {
@@ -192,7 +187,7 @@ Aligned Replay::inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& c
 
 unsigned Replay::aprioriStep(unsigned code, unsigned trellisStep, Mistake mistake) const
 {
-    const unsigned K = itsModel.windows.K;
+    const unsigned K = itsModel.cut.K();
     const auto& order = itsModel.codes[code].order;
     switch (mistake.kind) {
     case Mistake::aprioriUnpermuted:
@@ -212,7 +207,7 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
 {
     const unsigned d = codeOf(pass);
     const Code& code = itsModel.codes[d];
-    const bool isTail = trellisStep >= itsModel.windows.K;
+    const bool isTail = trellisStep >= itsModel.cut.K();
     int apriori = 0;
     const unsigned back = mistake == Mistake::aprioriOfPassBefore ? 2 : 1;
     if (!isTail && pass >= back && mistake != Mistake::aprioriMissing) {
@@ -270,7 +265,7 @@ Column Replay::fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisSt
 
 bool Replay::givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const
 {
-    if (trellisStep >= itsModel.windows.K) {
+    if (trellisStep >= itsModel.cut.K()) {
         return true;
     }
     bool complete = true;
@@ -374,19 +369,19 @@ Metrics border(Metrics column, Mistake mistake)
 
 std::optional<unsigned> Replay::borderPass(unsigned pass, bool ofThisPass, Mistake mistake)
 {
-    const unsigned right = ofThisPass ? pass : pass - 2;
-    if (pass < 2) {
+    if (rules::isFirstPass(pass)) {
         return std::nullopt;
     }
+    const unsigned right = ofThisPass ? pass : rules::passBefore(pass);
     switch (mistake.kind) {
     case Mistake::borderOfThisPass:
         return pass;
     case Mistake::borderOfLastPass:
-        return pass - 2;
+        return rules::passBefore(pass);
     case Mistake::borderOfOtherCode:
         return pass - 1;
     case Mistake::borderLate:
-        return right < 2 ? std::nullopt : std::optional(right - 2);
+        return rules::isFirstPass(right) ? std::nullopt : std::optional(rules::passBefore(right));
     case Mistake::borderOfFirstPass:
         return pass % 2;
     default:
@@ -406,19 +401,19 @@ Replay::Metrics Replay::forwardStart(unsigned pass, unsigned segment, Mistake mi
     if (!from || segment == 0) {
         return {};
     }
-    const unsigned length = itsModel.windows.segmentLength;
+    const unsigned length = itsModel.cut.segmentLength();
     return border(reached(*from, Stage::forward, segment * length - 1, length > 1, mistake, complete), mistake);
 }
 
 Column Replay::forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const Windows& windows = itsModel.windows;
-    if (startsSegment(windows, trellisStep)) {
-        const Metrics start = forwardStart(pass, trellisStep / windows.segmentLength, mistake, complete);
+    const rules::Cut& cut = itsModel.cut;
+    if (cut.startsSegment(trellisStep)) {
+        const Metrics start = forwardStart(pass, trellisStep / cut.segmentLength(), mistake, complete);
         return inSteps(registered(start, mistake), complete);
     }
-    const bool hasEarlier = !startsSegment(windows, trellisStep - 1);
+    const bool hasEarlier = !cut.startsSegment(trellisStep - 1);
     const Metrics next = reached(pass, Stage::forward, trellisStep - 1, hasEarlier, mistake, complete);
     return inSteps(registered(next, mistake), complete);
 }
@@ -427,9 +422,9 @@ Replay::Metrics Replay::tail(unsigned pass, Mistake mistake) const
 {
     const Code& code = itsModel.codes[codeOf(pass)];
     trellis::Tail<int> steps{};
-    for (unsigned i = 0; i < 3; ++i) {
-        steps.x[i] = code.systematic[itsModel.windows.K + i];
-        steps.p[i] = code.parity[itsModel.windows.K + i];
+    for (unsigned i = 0; i < rules::tailSteps; ++i) {
+        steps.x[i] = code.systematic[itsModel.cut.K() + i];
+        steps.p[i] = code.parity[itsModel.cut.K() + i];
         if (mistake == Mistake::tailClipped) {
             const int sum = narrowed(steps.x[i] + steps.p[i], {});
             const int difference = narrowed(steps.x[i] - steps.p[i], {});
@@ -445,27 +440,25 @@ Replay::Metrics Replay::tail(unsigned pass, Mistake mistake) const
     return column;
 }
 
-Replay::Metrics Replay::backwardStart(unsigned pass, const Window& window, Mistake mistake, bool& complete) const
+Replay::Metrics Replay::backwardStart(unsigned pass, const rules::Window& window, Mistake mistake, bool& complete) const
 {
-    const Windows& windows = itsModel.windows;
-    if (windows.isFinal(window)) {
+    const rules::Cut& cut = itsModel.cut;
+    if (cut.startsAtTail(window)) {
         return border(tail(pass, mistake), mistake);
     }
-    // Rule 20: the last row of three or more starts from what the first row has just left.
-    const bool ofThisPass = windows.rows >= 3 && window.row + 1 == windows.rows;
-    const auto left = borderPass(pass, ofThisPass, mistake);
+    const auto left = borderPass(pass, cut.startsFromThisPass(window), mistake);
     if (!left) {
         return {};
     }
     const unsigned from = window.last + 1;
-    const bool hasEarlier = from < windows.at(from).last;
+    const bool hasEarlier = from < cut.windowAt(from).last;
     return border(reached(*left, Stage::backward, from, hasEarlier, mistake, complete), mistake);
 }
 
 Column Replay::backwardColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
 {
     bool complete = true;
-    const Window& window = itsModel.windows.at(trellisStep);
+    const rules::Window window = itsModel.cut.windowAt(trellisStep);
     if (trellisStep == window.last) {
         const Metrics start = backwardStart(pass, window, mistake, complete);
         return inSteps(registered(start, mistake), complete);
@@ -514,7 +507,7 @@ int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const
 unsigned Replay::roundingClass(unsigned pass, Stage stage, unsigned trellisStep) const
 {
     bool complete = true;
-    if (stage == Stage::intrinsic && pass > 0 && trellisStep < itsModel.windows.K) {
+    if (stage == Stage::intrinsic && pass > 0 && trellisStep < itsModel.cut.K()) {
         const unsigned from = aprioriStep(codeOf(pass), trellisStep, {});
         const int half = input({pass - 1, signalsOf(Stage::extrinsic).first, from}, complete) / 2;
         const int sum = twiceIntrinsicFromInputs(pass, trellisStep, {}, complete);

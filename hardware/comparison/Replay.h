@@ -118,7 +118,7 @@ private:
     /// another step, whose decisions may have left corrections pending.
     Metrics reached(unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, bool& complete) const;
     Metrics forwardStart(unsigned pass, unsigned segment, Mistake mistake, bool& complete) const;
-    Metrics backwardStart(unsigned pass, const Window& window, Mistake mistake, bool& complete) const;
+    Metrics backwardStart(unsigned pass, const rules::Window& window, Mistake mistake, bool& complete) const;
     Metrics tail(unsigned pass, Mistake mistake) const;
     /// The pass that leaves the column from which a segment or window starts; nothing where the state is unknown.
     static std::optional<unsigned> borderPass(unsigned pass, bool ofThisPass, Mistake mistake);

@@ -159,20 +159,20 @@ private:
 
     void addPlace(const Place& place)
     {
-        const Windows& windows = itsModel.windows;
+        const rules::Cut& cut = itsModel.cut;
         itsText += "First difference, in the order of computation (" + itsCompared.name + ':' +
                    std::to_string(itsDump.lineOf(place)) + "):\n";
         itsText += format("  half-iteration  %u, on the %s code\n", place.pass, codeName(place.pass));
-        const StepPlace where = itsModel.division.placeOf(place.step);
-        const Window& window = windows.at(std::min(place.step, windows.K - 1));
+        const rules::StepPlace where = itsModel.cut.placeOf(place.step);
+        const rules::Window window = cut.windowAt(place.step);
         itsText += format("  unit            %u, thread %u\n", where.unit, where.thread);
         itsText += format("  segment         %u of %u, steps %u to %u\n",
                           where.segment,
-                          windows.segments,
-                          where.segment * windows.segmentLength,
-                          (where.segment + 1) * windows.segmentLength - 1);
-        itsText += format(
-            "  window          %u of %u, steps %u to %u\n", where.window, windows.rows, window.first, window.last);
+                          cut.segments(),
+                          where.segment * cut.segmentLength(),
+                          (where.segment + 1) * cut.segmentLength() - 1);
+        itsText +=
+            format("  window          %u of %u, steps %u to %u\n", where.row, cut.rows(), window.first, window.last);
         itsText += format("  trellis step    %u, %s\n", place.step, bitText(place).c_str());
         itsText += format("  signal          %s\n", passSignals[place.signal]);
         addSource(place);
@@ -181,7 +181,7 @@ private:
 
     std::string bitText(const Place& place) const
     {
-        if (place.step >= itsModel.windows.K) {
+        if (place.step >= itsModel.cut.K()) {
             return "after the bits";
         }
         const unsigned bit = codeOf(place.pass) == 0 ? place.step : itsModel.codes[1].order[place.step];
@@ -271,19 +271,21 @@ private:
     /// The operation that gives a value, a start column among them.
     std::string startText(const Place& place) const
     {
-        const Windows& windows = itsModel.windows;
+        const rules::Cut& cut = itsModel.cut;
         const Stage stage = stageOf(place.signal);
-        if (stage == Stage::forward && place.step % windows.segmentLength == 0 && place.step < windows.K) {
-            return place.step == 0  ? "the known state at the beginning (rule 10)"
-                   : place.pass < 2 ? "the unknown state at the start of the segment (rules 10 and 19)"
-                                    : "the border metrics at the start of the segment (rules 11 and 19), or the step "
-                                      "that leads to them";
+        if (stage == Stage::forward && cut.startsSegment(place.step)) {
+            return place.step == 0 ? "the known state at the beginning (rule 10)"
+                   : rules::isFirstPass(place.pass)
+                       ? "the unknown state at the start of the segment (rules 10 and 19)"
+                       : "the border metrics at the start of the segment (rules 11 and 19), or the step "
+                         "that leads to them";
         }
-        if (stage == Stage::backward && windows.at(place.step).last == place.step) {
-            return windows.isFinal(windows.at(place.step)) ? "the metrics of the tail (rule 12)"
-                   : place.pass < 2 ? "the unknown state at the start of the window (rules 10 and 20)"
-                                    : "the border metrics at the start of the window (rules 11 and 20), or the step "
-                                      "that leads to them";
+        if (stage == Stage::backward && cut.windowAt(place.step).last == place.step) {
+            return cut.startsAtTail(cut.windowAt(place.step)) ? "the metrics of the tail (rule 12)"
+                   : rules::isFirstPass(place.pass)
+                       ? "the unknown state at the start of the window (rules 10 and 20)"
+                       : "the border metrics at the start of the window (rules 11 and 20), or the step "
+                         "that leads to them";
         }
         return wordsOf(stage).operation;
     }

@@ -8,51 +8,51 @@ namespace morvik::comparison {
 
 namespace {
 
-bool startsSegment(const Windows& windows, const Place& place)
+bool startsSegment(const rules::Cut& cut, const Place& place)
 {
-    return stageOf(place.signal) == Stage::forward && place.step < windows.K && place.step % windows.segmentLength == 0;
+    return stageOf(place.signal) == Stage::forward && cut.startsSegment(place.step);
 }
 
-bool startsWindow(const Windows& windows, const Place& place)
+bool startsWindow(const rules::Cut& cut, const Place& place)
 {
-    return stageOf(place.signal) == Stage::backward && place.step < windows.K &&
-           windows.at(place.step).last == place.step;
+    return stageOf(place.signal) == Stage::backward && place.step < cut.K() &&
+           cut.windowAt(place.step).last == place.step;
 }
 
-bool startsAtTail(const Windows& windows, const Place& place)
+bool startsAtTail(const rules::Cut& cut, const Place& place)
 {
-    return startsWindow(windows, place) && place.step + 1 == windows.K;
+    return startsWindow(cut, place) && place.step + 1 == cut.K();
 }
 
-bool startsInLastRow(const Windows& windows, const Place& place)
+bool startsInLastRow(const rules::Cut& cut, const Place& place)
 {
-    return windows.rows > 1 && startsWindow(windows, place) && windows.at(place.step).row + 1 == windows.rows;
+    return cut.rows() > 1 && startsWindow(cut, place) && cut.windowAt(place.step).row + 1 == cut.rows();
 }
 
 /// The narrow ones first.
 constexpr std::array<PlaceKind, 8> kinds = {{
     {"at the beginning of segment 0 alone",
-     [](const Windows& windows, const Place& place) {
-         return startsSegment(windows, place) && place.step == 0;
+     [](const rules::Cut& cut, const Place& place) {
+         return startsSegment(cut, place) && place.step == 0;
      }},
     {"at window edges alone: where segments start",
-     [](const Windows& windows, const Place& place) {
-         return startsSegment(windows, place) && place.step > 0;
+     [](const rules::Cut& cut, const Place& place) {
+         return startsSegment(cut, place) && place.step > 0;
      }},
     {"at window edges alone: where segments start, segment 0 among them", startsSegment},
     {"at the tail alone: where the last window starts", startsAtTail},
     {"at window edges alone: where windows of the last row start",
-     [](const Windows& windows, const Place& place) {
-         return startsInLastRow(windows, place) && !startsAtTail(windows, place);
+     [](const rules::Cut& cut, const Place& place) {
+         return startsInLastRow(cut, place) && !startsAtTail(cut, place);
      }},
     {"at window edges alone: where windows start",
-     [](const Windows& windows, const Place& place) {
-         return startsWindow(windows, place) && !startsAtTail(windows, place);
+     [](const rules::Cut& cut, const Place& place) {
+         return startsWindow(cut, place) && !startsAtTail(cut, place);
      }},
     {"at window edges alone: where windows start, at the tail as well", startsWindow},
     {"in the tail alone",
-     [](const Windows& windows, const Place& place) {
-         return place.step >= windows.K;
+     [](const rules::Cut& cut, const Place& place) {
+         return place.step >= cut.K();
      }},
 }};
 
@@ -78,7 +78,7 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
 {
     const auto* const kind = std::find_if(kinds.begin(), kinds.end(), [&](const PlaceKind& each) {
         return std::all_of(
-            faults.begin(), faults.end(), [&](const Fault& fault) { return each.matches(model.windows, fault.place); });
+            faults.begin(), faults.end(), [&](const Fault& fault) { return each.matches(model.cut, fault.place); });
     });
     itsKind = kind != kinds.end() ? kind : nullptr;
     itsPass = common(faults, [](const Place& place) { return place.pass; });
@@ -91,11 +91,11 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
     itsFirst = fewest->place.step;
     itsLast = most->place.step;
     itsIsOnePlace = faults.size() == 1;
-    if (itsKind == nullptr && model.windows.segments > 1) {
-        itsSegment = common(faults, [&](const Place& place) { return model.division.placeOf(place.step).segment; });
-        itsUnit = common(faults, [&](const Place& place) { return model.division.placeOf(place.step).unit; });
+    if (itsKind == nullptr && model.cut.segments() > 1) {
+        itsSegment = common(faults, [&](const Place& place) { return model.cut.placeOf(place.step).segment; });
+        itsUnit = common(faults, [&](const Place& place) { return model.cut.placeOf(place.step).unit; });
     }
-    if (model.division.units() < 2) {
+    if (model.cut.unitsAtWork() < 2) {
         itsUnit.reset();
     }
     constexpr std::size_t fewestSpread = 8;  // fewer faults are close to each other by chance
@@ -111,21 +111,21 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
 
 unsigned Where::stepsAround() const
 {
-    const Windows& windows = itsModel->windows;
-    return itsSegment ? windows.segmentLength : itsUnit ? windows.K / itsModel->division.units() : windows.K;
+    const rules::Cut& cut = itsModel->cut;
+    return itsSegment ? cut.segmentLength() : itsUnit ? cut.K() / itsModel->cut.unitsAtWork() : cut.K();
 }
 
 bool Where::contains(const Place& place) const
 {
     if (stageOf(place.signal) != itsStage || !itsSignals.test(place.signal) ||
-        (itsKind != nullptr && !itsKind->matches(itsModel->windows, place)) || (itsPass && *itsPass != place.pass) ||
+        (itsKind != nullptr && !itsKind->matches(itsModel->cut, place)) || (itsPass && *itsPass != place.pass) ||
         (itsCode && *itsCode != codeOf(place.pass))) {
         return false;
     }
     if ((itsHasRange || itsIsOnePlace) && (place.step < itsFirst || place.step > itsLast)) {
         return false;
     }
-    const StepPlace where = itsModel->division.placeOf(place.step);
+    const rules::StepPlace where = itsModel->cut.placeOf(place.step);
     return (!itsSegment || *itsSegment == where.segment) && (!itsUnit || *itsUnit == where.unit);
 }
 

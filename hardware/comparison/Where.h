@@ -16,7 +16,7 @@ namespace morvik::comparison {
 /// A kind of place in a block.
 struct PlaceKind {
     const char* text;
-    bool (*matches)(const Windows&, const Place&);
+    bool (*matches)(const rules::Cut&, const Place&);
 };
 
 /// Places of one stage.

@@ -102,7 +102,7 @@ void Decoder::decode(const SoftBlock& block,
 Decoded Decoder::decodeWithRatios(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag)
 {
     Decoded decoded;
-    decoded.bits.resize(block.size() - tailPositions);
+    decoded.bits.resize(block.size() - rules::tailPositions);
     decoded.ratios.resize(decoded.bits.size());
     veltra_ip_morvik_v1_0_batch_outputs outputs{};
     outputs.dout = decoded.bits.data();

@@ -40,12 +40,13 @@ Passes::Passes(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& gen
     if (bits.empty()) {
         throw Refusal("holds no bit but those of the tail");
     }
-    itsDivision.emplace(itsComponent);
+    itsCut =
+        rules::Cut(itsComponent.itsBlockSize - rules::tailSteps, itsComponent.itsNumPU, itsComponent.itsThreadsPerPU);
 }
 
-const Division& Passes::division() const
+const rules::Cut& Passes::cut() const
 {
-    return *itsDivision;
+    return itsCut;
 }
 
 const TDecoder3GPU& Passes::component() const
@@ -67,7 +68,7 @@ std::int16_t Passes::value(unsigned signal, std::uint32_t step) const
 
 bool Passes::isComputed(unsigned signal, std::uint32_t step) const
 {
-    const std::uint32_t K = itsDivision->K();
+    const std::uint32_t K = itsCut.K();
     return step < K || signal == intrinsic || (step == K && signal >= forward && signal < backward);
 }
 

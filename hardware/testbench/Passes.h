@@ -4,11 +4,11 @@
 
 #include <array>
 #include <cstdint>
-#include <optional>
 #include <ostream>
 
 #include "Decoder.h"
-#include "Division.h"
+#include "rules/Cut.h"
+#include "rules/Schedule.h"
 
 class TDecoder3GPU;
 
@@ -26,7 +26,7 @@ constexpr unsigned passBits = 12;
 /// A constituent code by the encoder that it is of: half-iteration 0 decodes the second, the interleaved one (rule 15).
 constexpr unsigned constituentCode(unsigned halfIteration)
 {
-    return halfIteration % 2 == 0 ? 2 : 1;
+    return rules::constituentOf(halfIteration) + 1;
 }
 
 /// Runs half-iterations on a block, on a decoder that has decoded nothing before.
@@ -35,7 +35,8 @@ public:
     /// Throws Refusal when the library refuses generics or block. `warnings` outlives the passes.
     Passes(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, std::ostream& warnings);
 
-    const Division& division() const;
+    /// How the core cuts the block.
+    const rules::Cut& cut() const;
 
     /// The component that computes, with the streams of both constituent codes.
     const TDecoder3GPU& component() const;
@@ -54,7 +55,7 @@ public:
 private:
     Decoder itsDecoder;
     TDecoder3GPU& itsComponent;
-    std::optional<Division> itsDivision;
+    rules::Cut itsCut;
     unsigned itsNext = 0;
 };
 

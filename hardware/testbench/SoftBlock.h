@@ -6,13 +6,12 @@
 #include <cstdint>
 #include <vector>
 
+#include "rules/Tail.h"
+
 namespace morvik {
 
-/// Positions of the largest block of 3GPP TS 36.212: 6144 bits and four positions of tail.
-constexpr std::size_t maxPositions = 6144 + 4;
-
-/// Positions of a block behind its K bits, which hold the twelve values of the tail.
-constexpr std::size_t tailPositions = 4;
+/// Positions of the largest block of 3GPP TS 36.212.
+constexpr std::size_t maxPositions = 6144 + rules::tailPositions;
 
 /// The streams d(0), d(1) and d(2) of 3GPP TS 36.212, clause 5.1.3.2: K + 4 values each, tail included.
 struct SoftBlock {

@@ -16,9 +16,9 @@ public:
 
     void add(const Passes& passes, std::uint32_t halfIteration) override
     {
-        const Division& division = passes.division();
-        for (std::uint32_t step = 0; step < division.K() + tailSteps; ++step) {
-            const StepPlace place = division.placeOf(step);
+        const rules::Cut& cut = passes.cut();
+        for (std::uint32_t step = 0; step < cut.K() + rules::tailSteps; ++step) {
+            const rules::StepPlace place = cut.placeOf(step);
             if (!itsSelection.showsUnit(place.unit)) {
                 continue;
             }
@@ -26,7 +26,7 @@ public:
                       constituentCode(halfIteration),
                       step,
                       place.segment,
-                      place.window,
+                      place.row,
                       place.unit,
                       place.thread};
             for (const unsigned signal : itsSelection.signals) {

@@ -32,7 +32,7 @@ std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<vectors::TableWriter> ta
                                         const Selection& selection);
 
 /// Waveforms as a value change dump (IEEE 1364-2001, clause 18).
-std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const Division& division, const Selection& selection);
+std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const rules::Cut& cut, const Selection& selection);
 
 /// Writes the library's own trace of the selected half-iterations, with the input streams before them.
 void writeText(const SoftBlock& block,

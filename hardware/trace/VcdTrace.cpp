@@ -15,14 +15,14 @@ namespace {
 /// segment, and those of the tail.
 class VcdTrace : public TraceWriter {
 public:
-    VcdTrace(base::OutputFile file, const Division& division, Selection selection)
+    VcdTrace(base::OutputFile file, const rules::Cut& cut, Selection selection)
         : itsSelection(std::move(selection)),
-          itsLength(division.segmentLength() + tailSteps),
+          itsLength(cut.segmentLength() + rules::tailSteps),
           itsFile(std::move(file),
                   "A unit of time is a trellis step of every segment; half-iteration h begins at h * " +
                       std::to_string(itsLength) + '.')
     {
-        declare(division);
+        declare(cut);
         itsFile.endDeclarations(std::uint64_t{itsSelection.first} * itsLength);
     }
 
@@ -58,13 +58,13 @@ private:
         std::vector<Signal> signals;
     };
 
-    void declare(const Division& division)
+    void declare(const rules::Cut& cut)
     {
         itsFile.beginScope("morvik");
         itsHalfIteration = itsFile.addWire("half_iteration", 5);
         itsCode = itsFile.addWire("code", 2);
-        for (std::uint32_t segment = 0; segment < division.segments(); ++segment) {
-            const StepPlace place = division.placeOf(segment * division.segmentLength());
+        for (std::uint32_t segment = 0; segment < cut.segments(); ++segment) {
+            const rules::StepPlace place = cut.placeOf(segment * cut.segmentLength());
             if (!itsSelection.showsUnit(place.unit)) {
                 continue;
             }
@@ -72,14 +72,14 @@ private:
                 itsFile.beginScope("unit" + std::to_string(place.unit));
             }
             declareThread(place);
-            if (place.thread + 1 == division.segments() / division.units()) {
+            if (place.thread + 1 == cut.segmentsOfUnit()) {
                 itsFile.endScope();
             }
         }
         itsFile.endScope();
     }
 
-    void declareThread(const StepPlace& place)
+    void declareThread(const rules::StepPlace& place)
     {
         itsFile.beginScope("thread" + std::to_string(place.thread));
         Thread thread = {place.segment, itsFile.addWire("step", 13), itsFile.addWire("window", 4), {}};
@@ -95,12 +95,11 @@ private:
     /// there.
     void setThread(const Passes& passes, const Thread& thread, std::uint32_t time)
     {
-        const Division& division = passes.division();
-        const bool works = time < division.segmentLength() || thread.segment + 1 == division.segments();
-        const std::uint32_t step = thread.segment * division.segmentLength() + time;
+        const rules::Cut& cut = passes.cut();
+        const bool works = time < cut.segmentLength() || thread.segment + 1 == cut.segments();
+        const std::uint32_t step = thread.segment * cut.segmentLength() + time;
         itsFile.setWire(thread.step, works ? std::optional<std::int64_t>(step) : std::nullopt);
-        itsFile.setWire(thread.window,
-                        works ? std::optional<std::int64_t>(division.placeOf(step).window) : std::nullopt);
+        itsFile.setWire(thread.window, works ? std::optional<std::int64_t>(cut.placeOf(step).row) : std::nullopt);
         for (std::size_t i = 0; i < thread.signals.size(); ++i) {
             const unsigned signal = itsSelection.signals[i];
             if (!works || !passes.isComputed(signal, step)) {
@@ -122,9 +121,9 @@ private:
 
 }  // namespace
 
-std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const Division& division, const Selection& selection)
+std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const rules::Cut& cut, const Selection& selection)
 {
-    return std::make_unique<VcdTrace>(std::move(file), division, selection);
+    return std::make_unique<VcdTrace>(std::move(file), cut, selection);
 }
 
 }  // namespace morvik::trace

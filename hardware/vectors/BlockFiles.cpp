@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <array>
 
-#include "hardware/testbench/Division.h"
 #include "hardware/testbench/SoftBlock.h"
 #include "rules/BlockSizes.h"
 #include "simulation/Error.h"
@@ -230,7 +229,7 @@ void BlockReader::readRow(std::size_t table)
 
 void BlockReader::readStimulus(Stimulus& stimulus)
 {
-    for (std::size_t position = 0; position < stimulus.K + tailPositions; ++position) {
+    for (std::size_t position = 0; position < stimulus.K + rules::tailPositions; ++position) {
         Row values;
         for (std::size_t table = itsLayout.stimulus; table < itsLayout.expected; ++table) {
             readRow(table);
@@ -257,7 +256,7 @@ void BlockReader::readExpected(Expected& expected, std::uint32_t K)
 
 void BlockReader::readInternal(Expected& expected, std::uint32_t K)
 {
-    for (std::uint32_t i = 0; i < 2 * itsIterations * (K + tailSteps); ++i) {
+    for (std::uint32_t i = 0; i < rules::halfIterations(itsIterations) * (K + rules::tailSteps); ++i) {
         readRow(itsLayout.internal);
         InternalStep step;
         step.halfIteration = static_cast<std::uint32_t>(itsRow[0]);

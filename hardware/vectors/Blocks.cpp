@@ -9,7 +9,7 @@
 #include "link/DefaultScale.h"
 #include "link/FrameSource.h"
 #include "rules/BlockSizes.h"
-#include "src/Segmentation.h"
+#include "rules/Cut.h"
 
 namespace morvik::vectors {
 
@@ -17,8 +17,7 @@ namespace {
 
 constexpr std::int8_t lowest = -128;
 constexpr std::int8_t highest = 127;
-constexpr unsigned threadsOfUnit = 4;
-constexpr std::size_t mostRows = 3;
+constexpr unsigned mostRows = 3;
 
 /// The frames of random bits are numbered on from size to size; those of directed blocks have numbers of their own.
 constexpr std::uint64_t firstDirectedFrame = std::uint64_t{1} << 32;
@@ -110,7 +109,7 @@ public:
     {
         Stimulus stimulus{named.name, K, nextTag(), {}};
         for (unsigned stream = 0; stream < stimulus.streams.size(); ++stream) {
-            for (unsigned position = 0; position < K + tailPositions; ++position) {
+            for (unsigned position = 0; position < K + rules::tailPositions; ++position) {
                 stimulus.streams[stream].push_back(named.pattern(stream, position, position >= K));
             }
         }
@@ -143,13 +142,6 @@ private:
     std::uint32_t itsTag = 0;
 };
 
-/// How the core cuts a block of K bits: its segments, and the windows of each, which make as many rows.
-std::pair<std::uint32_t, std::size_t> cutOf(unsigned K, unsigned units)
-{
-    const std::uint32_t segments = segmentation::segmentCount(K, std::uint64_t{units} * threadsOfUnit);
-    return {segments, segmentation::windowStarts(K / segments).size() - 1};
-}
-
 void takeDirected(const Settings& settings, Source& source)
 {
     std::uint64_t frame = firstDirectedFrame;
@@ -161,9 +153,11 @@ void takeDirected(const Settings& settings, Source& source)
     }
     const auto units = static_cast<unsigned>(settings.generics.C_NUM_PU);
     for (const unsigned K : edgeSizes(units)) {
-        const auto [segments, rows] = cutOf(K, units);
+        const rules::Cut cut(K, units);
         source.takeRandom(
-            "size_of_" + std::to_string(segments) + "_segments_" + std::to_string(rows) + "_rows", K, frame++);
+            "size_of_" + std::to_string(cut.segments()) + "_segments_" + std::to_string(cut.rows()) + "_rows",
+            K,
+            frame++);
     }
     for (const std::uint32_t tag : edgeTags(static_cast<unsigned>(settings.generics.C_TAG_WIDTH))) {
         source.takeFrame("tag_" + std::to_string(tag), standard::blockSizes.front().K, frame++, tag);
@@ -191,9 +185,10 @@ std::vector<unsigned> edgeSizes(unsigned units)
     for (std::size_t i = 1; i < standard::blockSizes.size(); ++i) {
         const unsigned before = standard::blockSizes[i - 1].K;
         const unsigned K = standard::blockSizes[i].K;
-        const auto cutBefore = cutOf(before, units);
-        const auto cut = cutOf(K, units);
-        if (cut != cutBefore && std::min(cut.second, cutBefore.second) <= mostRows) {
+        const rules::Cut cutBefore(before, units);
+        const rules::Cut cut(K, units);
+        const bool isOther = cut.segments() != cutBefore.segments() || cut.rows() != cutBefore.rows();
+        if (isOther && std::min(cut.rows(), cutBefore.rows()) <= mostRows) {
             sizes.push_back(before);
             sizes.push_back(K);
         }

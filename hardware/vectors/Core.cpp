@@ -1,6 +1,8 @@
 // Core: the model as the source of what is expected.
 #include "Core.h"
 
+#include "rules/Tail.h"
+
 namespace morvik::vectors {
 
 namespace {
@@ -16,8 +18,8 @@ SoftBlock softBlock(const Stimulus& stimulus)
 std::vector<InternalStep> internalSteps(Passes passes, std::uint32_t iterations)
 {
     std::vector<InternalStep> steps;
-    const std::uint32_t count = passes.division().K() + tailSteps;
-    for (std::uint32_t halfIteration = 0; halfIteration < 2 * iterations; ++halfIteration) {
+    const std::uint32_t count = passes.cut().K() + rules::tailSteps;
+    for (std::uint32_t halfIteration = 0; halfIteration < rules::halfIterations(iterations); ++halfIteration) {
         passes.next();
         for (std::uint32_t step = 0; step < count; ++step) {
             steps.push_back({halfIteration, step, {}});

@@ -9,7 +9,7 @@ trap 'rm -rf "$folder"' EXIT
 
 compile_in() {
     mkdir -p "$1/build"
-    cp -r "$source/src" "$source/lanes" "$source/include" "$source/standard" "$1/"
+    cp -r "$source/src" "$source/lanes" "$source/include" "$source/rules" "$1/"
     python3 - "$source" "$commands" "$1" <<'PYTHON'
 import json
 import pathlib
@@ -18,7 +18,7 @@ import subprocess
 import sys
 
 source, commands, folder = sys.argv[1:]
-wanted = {f"{source}/{name}" for name in ("src/Components.cpp", "src/TDecoder.cpp", "src/Segmentation.cpp")}
+wanted = {f"{source}/{name}" for name in ("src/Components.cpp", "src/TDecoder.cpp", "src/TNumberFormat.cpp")}
 found = {entry["file"]: entry["command"] for entry in json.load(open(commands)) if entry["file"] in wanted}
 assert found.keys() == wanted, found.keys()
 for file, command in found.items():

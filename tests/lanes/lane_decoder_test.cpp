@@ -10,7 +10,6 @@
 #include <string>
 #include <vector>
 
-#include "Segmentation.h"
 #include "TCalculationEngine.h"
 #include "TDecoder3GPU.h"
 #include "TInterleaver.h"
@@ -24,6 +23,7 @@ namespace {
 
 using lanes::Algorithm;
 using lanes::LaneDecoder;
+using morvik::rules::Cut;
 
 /// 6 steps up to a magnitude of 63, 4 up to 127, and so on (rule 9), by quarters of a magnitude in steps.
 constexpr lanes::CorrectionTable corrections = {6, 4, 3, 2, 1, 1};
@@ -48,16 +48,6 @@ struct Components {
         decoder->itsExtrinsicScale = algorithm == Algorithm::greatestScaled ? 0.75 : 1.0;
     }
 };
-
-lanes::BlockCut cutOf(unsigned K, unsigned units, const TInterleaver& interleaver)
-{
-    lanes::BlockCut cut;
-    cut.blockSize = K;
-    cut.segments = segmentation::segmentCount(K, std::uint64_t{4} * units);
-    cut.windowStart = segmentation::windowStarts(K / cut.segments);
-    interleaver.calcInterleaver(cut.permutation, K);
-    return cut;
-}
 
 std::vector<short> alignedSoftValues(const morvik::blocks::Block& block)
 {
@@ -107,7 +97,7 @@ std::vector<Results> laneResults(LaneDecoder& decoder,
 {
     std::vector<lanes::Streams<std::int32_t>> streams;
     streams.reserve(blocks.size());
-    std::vector<Results> all(blocks.size(), Results(decoder.blockCut().blockSize));
+    std::vector<Results> all(blocks.size(), Results(decoder.cut().K()));
     for (const morvik::blocks::Block& block : blocks) {
         streams.push_back({block.sys.data(), block.par1.data(), block.par2.data()});
     }
@@ -154,7 +144,7 @@ protected:
     {
         Components components(units, algorithm);
         LaneDecoder decoder(*GetParam(), algorithm, corrections);
-        decoder.setBlockCut(cutOf(K, units, *components.interleaver));
+        decoder.setCut(Cut(K, units));
         std::vector<std::vector<Results>> expected;
         expected.reserve(blocks.size());
         for (const morvik::blocks::Block& block : blocks) {
@@ -366,9 +356,8 @@ template <class Input>
 void expectEachNoticed(const lanes::InstructionSet& instructionSet, Input beyond)
 {
     constexpr unsigned K = 40;
-    const std::unique_ptr<TInterleaver> interleaver(TInterleaver::create("3GPPLTE"));
     LaneDecoder decoder(instructionSet, Algorithm::greatest, corrections);
-    decoder.setBlockCut(cutOf(K, 2, *interleaver));
+    decoder.setCut(Cut(K, 2));
     for (const Input within : {Input{-128}, Input{127}}) {
         std::vector<Input> values(3 * (K + 4), within);
         const lanes::Streams<Input> streams = {&values[0], &values[K + 4], &values[2 * (K + 4)]};
@@ -408,8 +397,7 @@ TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
     unsigned turn = seed;
     for (const unsigned K : morvik::blocks::blockSizes()) {
         for (const unsigned units : {2U, 4U, 8U}) {
-            const unsigned capacity =
-                std::max(1U, lanesOfRow() / segmentation::segmentCount(K, std::uint64_t{4} * units));
+            const unsigned capacity = std::max(1U, lanesOfRow() / Cut(K, units).segments());
             for (const Algorithm algorithm : algorithms) {
                 if (!all && turn % combinationsPerOneTaken != 0) {
                     ++turn;

@@ -136,13 +136,13 @@ TEST(FindShifts, TellsOfADumpThatIsLate)
 TEST(StepsInOrder, TakeTheSegmentsTogether)
 {
     const Model model = modelOf(512, 8, 1, 1);
-    const auto forward = stepsInOrder(model.windows, Stage::forward);
+    const auto forward = stepsInOrder(model.cut, Stage::forward);
     ASSERT_EQ(forward.size(), 513U);
     EXPECT_EQ(forward[0], 0U);
     EXPECT_EQ(forward[1], 64U);
     EXPECT_EQ(forward[8], 1U);
     EXPECT_EQ(forward[512], 512U);
-    const auto backward = stepsInOrder(model.windows, Stage::backward);
+    const auto backward = stepsInOrder(model.cut, Stage::backward);
     ASSERT_EQ(backward.size(), 512U);
     EXPECT_EQ(backward[0], 63U);
     EXPECT_EQ(backward[1], 127U);

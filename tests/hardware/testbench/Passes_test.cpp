@@ -1,5 +1,4 @@
-// Passes and Division: the values of each pass against the model's own trace and the rules, and where they are
-// computed.
+// Passes: the values of each pass against the model's own trace and the rules.
 #include "hardware/testbench/Passes.h"
 
 #include <gtest/gtest.h>
@@ -16,7 +15,6 @@ namespace {
 
 using morvik::Passes;
 using morvik::passSignals;
-using morvik::StepPlace;
 
 veltra_ip_morvik_v1_0_generics core(int numPu, int algorithm)
 {
@@ -129,50 +127,6 @@ TEST(Passes, AlternatesTheCodes)
 {
     EXPECT_EQ(morvik::constituentCode(0), 2U);
     EXPECT_EQ(morvik::constituentCode(1), 1U);
-}
-
-void expectPlace(const morvik::Division& division, unsigned step, const StepPlace& expected)
-{
-    const StepPlace place = division.placeOf(step);
-    EXPECT_EQ(place.segment, expected.segment) << step;
-    EXPECT_EQ(place.window, expected.window) << step;
-    EXPECT_EQ(place.unit, expected.unit) << step;
-    EXPECT_EQ(place.thread, expected.thread) << step;
-}
-
-TEST(Division, PlacesStepsOfSegmentsWithThreeWindows)
-{
-    std::ostringstream warnings;
-    const Passes passes(randomBlock(1280), core(2, 1), warnings);
-    const morvik::Division& division = passes.division();
-    EXPECT_EQ(division.K(), 1280U);
-    EXPECT_EQ(division.segments(), 8U);
-    EXPECT_EQ(division.segmentLength(), 160U);
-    EXPECT_EQ(division.units(), 2U);
-    expectPlace(division, 0, {0, 0, 0, 0});
-    expectPlace(division, 63, {0, 0, 0, 0});
-    expectPlace(division, 64, {0, 1, 0, 0});
-    expectPlace(division, 111, {0, 1, 0, 0});
-    expectPlace(division, 112, {0, 2, 0, 0});
-    expectPlace(division, 159, {0, 2, 0, 0});
-    expectPlace(division, 160, {1, 0, 0, 1});
-    expectPlace(division, 639, {3, 2, 0, 3});
-    expectPlace(division, 640, {4, 0, 1, 0});
-    expectPlace(division, 1282, {7, 2, 1, 3});
-}
-
-TEST(Division, DealsFewSegmentsToAllUnits)
-{
-    std::ostringstream warnings;
-    const Passes half(randomBlock(1280), core(8, 1), warnings);
-    EXPECT_EQ(half.division().units(), 8U);
-    expectPlace(half.division(), 3 * 80, {3, 0, 1, 1});
-    const Passes two(randomBlock(128), core(8, 1), warnings);
-    EXPECT_EQ(two.division().units(), 2U);
-    expectPlace(two.division(), 64, {1, 0, 1, 0});
-    const Passes one(randomBlock(40), core(8, 1), warnings);
-    EXPECT_EQ(one.division().units(), 1U);
-    expectPlace(one.division(), 42, {0, 0, 0, 0});
 }
 
 }  // namespace

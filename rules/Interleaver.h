@@ -1,0 +1,47 @@
+// Interleaver: the order in which the second constituent code takes a block (rule 15 of docs/arithmetic.md).
+#ifndef MORVIK_RULES_INTERLEAVER_H
+#define MORVIK_RULES_INTERLEAVER_H
+
+#include <cstdint>
+
+#include "BlockSizes.h"
+
+namespace morvik::rules {
+
+using standard::BlockSize;
+
+/// The addresses Pi(i) = (f1 i + f2 i^2) mod K for i = 0, 1, ... K - 1: position i of the interleaved order is position
+/// Pi(i) of the natural one (rule 15). Pi(i + 1) = Pi(i) + step(i) and step(i + 1) = step(i) + 2 f2, both modulo K: a
+/// generator of two adders. Every sum is below 2 K.
+class InterleaverAddress {
+public:
+    explicit constexpr InterleaverAddress(const BlockSize& size)
+        : itsK(size.K), itsStep((size.f1 + size.f2) % size.K), itsIncrement(2 * size.f2 % size.K)
+    {
+    }
+
+    /// Pi(0) at first, and with each further call the one that follows.
+    constexpr std::uint32_t next()
+    {
+        const std::uint32_t position = itsPosition;
+        itsPosition = sum(itsPosition, itsStep);
+        itsStep = sum(itsStep, itsIncrement);
+        return position;
+    }
+
+private:
+    /// Modulo K.
+    constexpr std::uint32_t sum(std::uint32_t a, std::uint32_t b) const
+    {
+        return a + b >= itsK ? a + b - itsK : a + b;
+    }
+
+    std::uint32_t itsK;
+    std::uint32_t itsPosition = 0;
+    std::uint32_t itsStep;
+    std::uint32_t itsIncrement;
+};
+
+}  // namespace morvik::rules
+
+#endif
