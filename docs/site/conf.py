@@ -16,7 +16,7 @@ copyright = "the authors of morvik"
 extensions = ["myst_parser", "breathe"]
 
 root_doc = "docs/index"
-include_patterns = ["*.md", "docs/*.md", "docs/*.rst", "examples/*.md", "data/*/*.md", "tests/*/*.md", "tests/data/*/*.md"]
+include_patterns = ["*.md", "docs/*.md", "docs/*.rst", "examples/*.md", "validation/*/*.md", "tests/*/*.md", "tests/data/*/*.md"]
 exclude_patterns = ["build", ".*"]
 nitpicky = True
 nitpick_ignore_regex = [("c:identifier", "u?int(8|16|32)_t|size_t"), ("cpp:identifier", "u?int32_t")]
