@@ -346,37 +346,43 @@ class Way:
 def flow():
     """How a block travels: the way by the lanes, and that by the components."""
     lanes, components, both = Way(20, 420), Way(560, 420), Way(290, 420)
-    end = both.stations(16, ("A call checks its arguments", "src/morvik_v1_0_bitacc_cmodel.cpp: bitacc_simulate",
-                             "src/morvik_v1_0_batch.cpp: batch_simulate, batch_count_errors",
-                             "src/SimulationCall.h: checkArguments"),
-                        ("Do the lanes take it?", "src/SimulationCall.cpp: lanesTake"))[-1]
+    end = both.stations(16, ("A call: one block is a batch of one", "src/morvik_v1_0_bitacc_cmodel.cpp: bitacc_simulate",
+                             "src/morvik_v1_0_batch.cpp: batch_simulate, batch_count_errors"),
+                        ("Arguments and room are checked", "src/SimulationCall.cpp: checkArguments, shortArray"),
+                        ("Do the lanes take it?", "src/SimulationCall.cpp: send", "src/PathChoice.cpp: lanesFor"))[-1]
     top = end + 56
     for way, label, side in ((lanes, "yes", -1), (components, "no: traced, preset, told so, or a wrong size", 1)):
         both.elements += [f'<path d="M{both.middle + side * 60} {end} v22 H{way.middle}" class="line"/>',
                           arrow(way.middle, end + 22, way.middle, top),
                           text(way.middle + side * 8, end + 40, label, "end" if side < 0 else "start", "small")]
 
-    left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/SimulationCall.cpp: loadLanes",
-                                "src/LanePath.cpp: takes, prepare"),
+    left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/LanePath.cpp: take, prepare, load",
+                                "rules/Cut.h: segmentCount, windowStart"),
                           ("A row for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
                            "lanes/Transpose.h: loadRows"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
                            "lanes/Kernels.cpp: decode, runPasses"),
                           ("A pass, window by window", "lanes/Pass.h: runPass, forwardStep, backwardStep",
                            "lanes/Rules.h: Greatest, Corrected", "lanes/Permute.h: Permutation"),
-                          ("Rows are spread over the caller's arrays", "lanes/LaneDecoder.cpp: decisions, ratios, spread"))
+                          ("Decisions", "src/LanePath.cpp: decisions, ratios", "lanes/LaneDecoder.cpp: spread"))
     lanes.again(left[2] + 32, left[3] - 12, "2 x iterations")
 
-    right = components.stations(top, ("Values are clipped and joined", "src/SimulationCall.cpp: decodeByComponents"),
+    right = components.stations(top, ("Values are clipped and joined", "src/ComponentPath.cpp: take",
+                                      "src/CoreInputs.h: forEachSoftValue"),
                                 ("Streams and tail, segments and windows", "src/TDecoder3G.cpp: decode, extract",
                                  "src/TDecoder3GPU.cpp: allocate, buildSegments", "rules/Cut.h: segmentCount, windowStart"),
                                 ("A half-iteration", "src/TDecoder3G.cpp: calcSISO, calcIntrinsic, calcLLR, calcExtrinsic",
                                  "src/TDecoder3GPU.cpp: calcGamma, calcAlpha, calcBeta",
                                  "src/TCalculationEngineModBase.cpp: gamma, alpha, beta, llr"),
-                                ("Decisions", "src/TDecoder3G.cpp: hardDecisions"))
+                                ("Decisions", "src/TDecoder3G.cpp: hardDecisions", "src/ComponentPath.cpp: decisions, ratios"))
     components.again(right[1] + 32, right[2] - 12, "2 x iterations")
 
-    bottom = both.station(max(left[-1], right[-1]) + 30, "The arithmetic of both, written once",
+    top = max(left[-1], right[-1]) + 30
+    for way, end, side in ((lanes, left[-1], both.left), (components, right[-1], both.left + both.width)):
+        both.elements += [f'<path d="M{way.middle} {end} V{top + 22}" class="line"/>',
+                          arrow(way.middle, top + 22, side, top + 22)]
+    bottom = both.station(top, "Decisions, ratios and tags are delivered", "src/SimulationCall.cpp: deliver")
+    bottom = both.station(bottom + 30, "The arithmetic of both, written once",
                           "rules/Trellis.h: branchSums, forwardStep, backwardStep, tailColumn",
                           "rules/Arithmetic.h: addWrap, subWrap, maxWrap, clip")
     return svg(1100, bottom + 20, both.elements + lanes.elements + components.elements)

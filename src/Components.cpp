@@ -1,15 +1,7 @@
-// Components: the six components of a state, made from its generics, and whether somebody has changed them since.
+// Components: the six components of a state, made from its generics.
 #include "Components.h"
 
-#include <cstring>
 #include <string>
-#include <type_traits>
-#include <typeinfo>
-
-#include "TCalculationEngineMod.h"
-#include "TCalculationEngineModHash.h"
-#include "TDecoder3GPU.h"
-#include "TInterleaver3GPPLTE.h"
 
 namespace components {
 
@@ -26,101 +18,6 @@ void releaseOne(Component*& component)
 {
     delete component;
     component = nullptr;
-}
-
-/// A value of any kind by its bits, so that one that is not a number equals itself.
-template <class Value>
-std::uint64_t bitsOf(Value value)
-{
-    if constexpr (std::is_pointer_v<Value>) {
-        return reinterpret_cast<std::uintptr_t>(value);
-    } else {
-        static_assert(std::is_scalar_v<Value> && sizeof(Value) <= sizeof(std::uint64_t));
-        std::uint64_t bits = 0;
-        std::memcpy(&bits, &value, sizeof(Value));
-        return bits;
-    }
-}
-
-template <class Use, class... Values>
-void useBits(Use& use, Values... values)
-{
-    (use(bitsOf(values)), ...);
-}
-
-template <class Use>
-void useFormat(const TNumberFormat& format, Use& use)
-{
-    useBits(use,
-            &format,
-            format.itsNBits,
-            format.itsBinPt,
-            format.itsShift,
-            format.itsScale,
-            format.itsMin,
-            format.itsMax,
-            format.itsMinQ,
-            format.itsMaxQ,
-            format.itsMask);
-}
-
-/// Calls use(bits) for each value that decides how components of the types that `create` makes decode.
-template <class Use>
-void useValues(const State& state, Use use)
-{
-    const auto& decoder = static_cast<const TDecoder3GPU&>(*state.decoder);
-    useBits(use,
-            state.decoder,
-            state.interleaver,
-            decoder.itsInterleaver,
-            decoder.itsEngine,
-            decoder.itsExtrinsicScale,
-            decoder.itsNumPU,
-            decoder.itsThreadsPerPU,
-            decoder.is3GPP2);
-    const auto& engine = static_cast<const TCalculationEngineModBase&>(*state.engine);
-    useBits(use,
-            state.engine,
-            engine.itsUseSSE2,
-            engine.itsInputFormat,
-            engine.itsStateFormat,
-            engine.itsBranchFormat,
-            engine.itsAlphaAlgorithmType,
-            engine.itsBetaAlgorithmType,
-            engine.itsLLRAlgorithmType,
-            engine.itsAlphaLUT,
-            engine.itsBetaLUT,
-            engine.itsLLRLUT);
-    for (const TNumberFormat* format : {state.state_format, state.input_format, state.branch_format}) {
-        useFormat(*format, use);
-    }
-}
-
-std::vector<std::uint64_t> valuesOf(const State& state)
-{
-    std::vector<std::uint64_t> values;
-    useValues(state, [&](std::uint64_t bits) { values.push_back(bits); });
-    return values;
-}
-
-bool haveTheirTypes(const State& state)
-{
-    const std::type_info& engine = typeid(*state.engine);
-    return typeid(*state.decoder) == typeid(TDecoder3GPU) &&
-           typeid(*state.interleaver) == typeid(TInterleaver3GPPLTE) &&
-           (engine == typeid(TCalculationEngineMod) || engine == typeid(TCalculationEngineModHash));
-}
-
-/// No difference of so many steps or more is corrected (rule 9).
-constexpr int correctedSteps = 64;
-
-/// The entries that correct, of all three tables of the engine.
-std::vector<unsigned char> correctionsOf(const State& state)
-{
-    const unsigned char* const anchor = static_cast<const TCalculationEngineModBase&>(*state.engine).itsAlphaLUT;
-    const int reach = correctedSteps << state.state_format->itsShift;
-    return anchor == nullptr ? std::vector<unsigned char>()
-                             : std::vector<unsigned char>(anchor - reach, anchor + reach);
 }
 
 }  // namespace
@@ -172,25 +69,6 @@ void release(State& state)
     releaseOne(state.engine);
     releaseOne(state.interleaver);
     releaseOne(state.decoder);
-}
-
-Snapshot::Snapshot(const State& state) : itsValues(valuesOf(state)), itsCorrections(correctionsOf(state)) {}
-
-bool Snapshot::matches(const State& state) const
-{
-    if (!haveTheirTypes(state)) {
-        return false;
-    }
-    const std::uint64_t* value = itsValues.data();
-    std::uint64_t different = 0;
-    useValues(state, [&](std::uint64_t bits) { different |= bits ^ *value++; });
-    if (different != 0) {
-        return false;
-    }
-    const auto& engine = static_cast<const TCalculationEngineModBase&>(*state.engine);
-    return itsCorrections.empty() ||
-           std::memcmp(engine.itsAlphaLUT - itsCorrections.size() / 2, itsCorrections.data(), itsCorrections.size()) ==
-               0;
 }
 
 }  // namespace components

@@ -10,7 +10,7 @@
 #include "TNumberFormat.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
-class LanePath;
+class PathChoice;
 
 /// A decoder state owns its six components; they refer to each other by plain links. The record is
 /// taken from malloc and given to free.
@@ -25,8 +25,7 @@ struct veltra_ip_morvik_v1_0_state {
     bool saturation_reported;      ///< whether the one saturation warning has been given
     bool tag_truncation_reported;  ///< whether the one tag truncation warning has been given
     std::uint32_t tag_mask;        ///< the tag bits that are kept
-    LanePath* lane_path;           ///< the quick way to decode; null in a record of a test bench's own components
-    bool by_components;            ///< whether the components decode even where the lanes could
+    PathChoice* path_choice;       ///< null in a record of a test bench's own components, which then decode
 };
 
 #endif

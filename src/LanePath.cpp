@@ -1,17 +1,14 @@
-// LanePath: the C interface's quick way through the lane-parallel decoder, beside the components.
+// LanePath: blocks through the lane-parallel decoder, which gives what the state's components would.
 #include "LanePath.h"
 
-#include <algorithm>
-#include <cstddef>
-#include <typeinfo>
-#include <utility>
-
+#include "CoreInputs.h"
 #include "TCalculationEngineModBase.h"
 #include "rules/Cut.h"
 
-namespace {
+using simulation_call::Batch;
+using simulation_call::Status;
 
-constexpr unsigned tailSteps = 3;  // of a trellis, behind its K others
+namespace {
 
 /// The engine's table, by quarters of a difference's magnitude in steps: its finest resolution (rule 9).
 lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
@@ -28,74 +25,36 @@ lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
     return table;
 }
 
-/// Whether somebody traces or presets values that the lanes do not have.
-bool isWatched(const TDecoder& decoder)
+std::uint32_t differences(const std::uint8_t* decisions, const std::uint8_t* sent, std::size_t K)
 {
-    return decoder.itsDumpCount != 0 || decoder.itsTraceLevel != 0 || !decoder.itsExtrinsicIn.empty();
+    std::uint32_t differing = 0;
+    for (std::size_t i = 0; i < K; ++i) {
+        differing += (decisions[i] != 0) != (sent[i] != 0) ? 1U : 0U;
+    }
+    return differing;
 }
 
-/// While it lives, a decoder works on the metric columns of another one. Exhausted memory may end it.
-class LentColumns {
-public:
-    LentColumns(TDecoder& owner, TDecoder& user) : itsOwner(owner), itsUser(user)
-    {
-        exchange();
-    }
-
-    ~LentColumns()
-    {
-        exchange();
-    }
-
-    LentColumns(const LentColumns&) = delete;
-    LentColumns& operator=(const LentColumns&) = delete;
-
-private:
-    void exchange()
-    {
-        std::swap(itsOwner.itsMetricBuffer, itsUser.itsMetricBuffer);
-        std::swap(itsOwner.itsMetricBufferSize, itsUser.itsMetricBufferSize);
-        std::swap(itsOwner.itsAlpha, itsUser.itsAlpha);
-        std::swap(itsOwner.itsBeta, itsUser.itsBeta);
-        std::swap(itsOwner.itsGamma, itsUser.itsGamma);
-    }
-
-    TDecoder& itsOwner;
-    TDecoder& itsUser;
-};
-
-bool isNoTableOf(const std::vector<unsigned>& table, unsigned K)
+/// The places of blocks of K values each, one after the other.
+template <class Value>
+void setPlaces(std::vector<Value*>& blocks, Value* first, std::size_t K)
 {
-    return table.size() != K;
-}
-
-bool isNoTableOf(const std::vector<TDecoder3GPU::ABSegment>& segments, unsigned K)
-{
-    return segments.empty() || segments.back().to != K;
-}
-
-bool areEqual(const std::vector<TDecoder3GPU::ABSegment>& a, const std::vector<TDecoder3GPU::ABSegment>& b)
-{
-    return std::equal(a.begin(), a.end(), b.begin(), b.end(), [](const auto& one, const auto& other) {
-        return one.from == other.from && one.to == other.to;
-    });
+    for (std::size_t b = 0; b < blocks.size(); ++b) {
+        blocks[b] = first + b * K;
+    }
 }
 
 }  // namespace
 
-LanePath::LanePath(const State& state, const lanes::InstructionSet& instructionSet)
-    : itsCreated(state),
-      itsGenerics(state.generics),
-      itsDecoder(static_cast<TDecoder3GPU&>(*state.decoder)),
+LanePath::LanePath(veltra_ip_morvik_v1_0_state& state,
+                   OriginalComponents& originals,
+                   MissedBlocks& missedBlocks,
+                   const lanes::InstructionSet& instructionSet)
+    : itsState(state),
+      itsOriginals(originals),
+      itsMissedBlocks(missedBlocks),
       itsCorrections(correctionTable(*state.engine))
 {
     setInstructionSet(instructionSet);
-}
-
-void LanePath::Release::operator()(State* state) const
-{
-    components::release(*state);
-    delete state;
 }
 
 const lanes::InstructionSet& LanePath::instructionSet() const
@@ -105,70 +64,24 @@ const lanes::InstructionSet& LanePath::instructionSet() const
 
 void LanePath::setInstructionSet(const lanes::InstructionSet& instructionSet)
 {
-    if (itsLanes != nullptr) {
-        keepLast();
-    }
+    handOverLastBlock();
     itsLanes = std::make_unique<lanes::LaneDecoder>(
-        instructionSet, static_cast<lanes::Algorithm>(itsGenerics.C_ALGORITHM_TYPE), itsCorrections);
+        instructionSet, static_cast<lanes::Algorithm>(itsOriginals.generics().C_ALGORITHM_TYPE), itsCorrections);
 }
 
-bool LanePath::takes(const State& state, unsigned K)
+unsigned LanePath::take(const Batch& batch, std::size_t first, unsigned most)
 {
-    if (!knows(state) || isWatched(itsDecoder) || !state.interleaver->valid(K)) {
-        return false;
+    prepare(batch.blockSize());
+    const unsigned taken = itsLanes->blocksTaken(most);
+    itsDecisions.resize(taken);
+    itsRatios.resize(taken);
+    const auto loadAll = [&](const auto& all) {
+        return load(batch, all, first, most);
+    };
+    if (!std::visit(loadAll, batch.streams)) {
+        loadClipped(batch, first);
     }
-    forgetBlocksOfOthers(state);
-    dropOtherTables(K);
-    if (!keepsTheirTables(K)) {
-        return false;
-    }
-    prepare(K);
-    return true;
-}
-
-/// A decoder that a test bench has put in since, be it in the same place, has decoded nothing of what the lanes have.
-void LanePath::forgetBlocksOfOthers(const State& state)
-{
-    if (state.decoder != &itsDecoder || typeid(*state.decoder) != typeid(TDecoder3GPU) ||
-        state.decoder->itsDecodeCount == 0) {
-        itsPast.clear();
-        itsIterations = 0;
-    }
-}
-
-/// The components would replace what decoder and interleaver keep of another size.
-void LanePath::dropOtherTables(unsigned K)
-{
-    for (std::vector<unsigned>* table : {&itsDecoder.itsInterleaver->itsPi, &itsDecoder.itsInterleaver->itsPiInv}) {
-        if (isNoTableOf(*table, K)) {
-            table->clear();
-        }
-    }
-    if (isNoTableOf(itsDecoder.itsAlphaSegment, K)) {
-        itsDecoder.itsAlphaSegment.clear();
-        itsDecoder.itsBetaSegment.clear();
-    }
-}
-
-/// Whether the tables of this size, where there are any, are the components' own: they would use a test bench's.
-bool LanePath::keepsTheirTables(unsigned K)
-{
-    const std::vector<unsigned>& pi = itsDecoder.itsInterleaver->itsPi;
-    const std::vector<unsigned>& piInv = itsDecoder.itsInterleaver->itsPiInv;
-    const auto& segments = itsDecoder.itsAlphaSegment;
-    if (pi.empty() && piInv.empty() && segments.empty()) {
-        return true;
-    }
-    TDecoder3GPU& made = twin();
-    const TInterleaver& interleaver = *made.itsInterleaver;
-    if (isNoTableOf(interleaver.itsPiInv, K) || isNoTableOf(made.itsAlphaSegment, K)) {
-        made.allocate(K + tailSteps);
-        interleaver.calcInterleaver(interleaver.itsPi, K);
-        interleaver.calcDeinterleaver(interleaver.itsPiInv, K);
-    }
-    return (pi.empty() || pi == interleaver.itsPi) && (piInv.empty() || piInv == interleaver.itsPiInv) &&
-           (segments.empty() || (itsDecoder.itsNT == made.itsNT && areEqual(segments, made.itsAlphaSegment) &&
-                                 areEqual(itsDecoder.itsBetaSegment, made.itsBetaSegment)));
+    return itsTaken;
 }
 
 /// Makes everything ready for blocks of K bits.
@@ -176,94 +89,108 @@ void LanePath::prepare(unsigned K)
 {
     const unsigned lastK = itsLanes->cut().K();
     if (K < lastK) {
-        keepLast();
+        handOverLastBlock();
     }
     if (K != lastK) {
-        itsLanes->setCut(morvik::rules::Cut(K, itsDecoder.itsNumPU, itsDecoder.itsThreadsPerPU));
+        const TDecoder3GPU& decoder = itsOriginals.decoder();
+        itsLanes->setCut(morvik::rules::Cut(K, decoder.itsNumPU, decoder.itsThreadsPerPU));
         itsIterations = 0;
     }
-    while (!itsPast.empty() && itsPast.back().K <= K) {
-        itsPast.pop_back();
-    }
+    itsMissedBlocks.overwrite(K);
 }
 
-unsigned LanePath::blocksTaken(unsigned blocks) const
+/// False when a value is beyond the input format: the blocks have to be loaded again, clipped.
+template <class Input>
+bool LanePath::load(const Batch& batch, const lanes::Streams<Input>& all, std::size_t first, unsigned most)
 {
-    return itsLanes->blocksTaken(blocks);
+    const unsigned taken = itsLanes->blocksTaken(most);
+    auto& blocks = std::get<Blocks<Input>>(itsBlocks);
+    blocks.resize(taken);
+    for (unsigned b = 0; b < taken; ++b) {
+        blocks[b] = batch.streamsOf(all, first + b);
+    }
+    itsIterations = 0;
+    itsTaken = taken;
+    return itsLanes->load(blocks.data(), most);
 }
 
-void LanePath::decode(unsigned iterations)
+/// Warnings come in the order of single calls: a block's tag before the values of the next one.
+void LanePath::loadClipped(const Batch& batch, std::size_t first)
+{
+    const auto size = static_cast<std::size_t>(batch.dinSize);
+    std::vector<std::int16_t> values(3 * size * itsTaken);
+    auto& blocks = std::get<Blocks<std::int16_t>>(itsBlocks);
+    blocks.resize(itsTaken);
+    for (unsigned b = 0; b < itsTaken; ++b) {
+        if (b > 0) {
+            core_inputs::truncateTag(itsState, batch.tag(first + b - 1));
+        }
+        std::int16_t* const to = values.data() + 3 * size * b;
+        const auto keep = [&](unsigned stream, std::int32_t position, std::int32_t integer) {
+            to[stream * size + static_cast<std::size_t>(position)] = static_cast<std::int16_t>(integer);
+        };
+        core_inputs::forEachSoftValue(itsState, batch, first + b, keep);
+        blocks[b] = {to, to + size, to + 2 * size};
+    }
+    itsLanes->load(blocks.data(), itsTaken);
+}
+
+Status LanePath::decode(unsigned iterations)
 {
     itsLanes->decode(0, 2 * iterations);
     count(iterations);
+    return simulation_call::success;
+}
+
+Status LanePath::countErrors(unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors)
+{
+    const std::size_t K = blockSize();
+    std::vector<std::uint8_t> bits(itsTaken * K);
+    for (unsigned t = 0; t < iterations; ++t) {
+        itsLanes->decode(2 * t, 2 * t + 2);
+        decisions(bits.data());
+        for (std::size_t b = 0; b < itsTaken; ++b) {
+            lanes::setValueAt(errors, b * iterations + t, differences(&bits[b * K], sent + b * K, K));
+        }
+    }
+    count(iterations);
+    return simulation_call::success;
 }
 
 void LanePath::count(unsigned iterations)
 {
+    TDecoder3GPU& decoder = itsOriginals.decoder();
     itsIterations = iterations;
-    itsDecoder.itsDecodeCount += itsLoaded;
-    itsDecoder.itsHalfIterationCount += std::uint64_t{2} * iterations * itsLoaded;
+    decoder.itsDecodeCount += itsTaken;
+    decoder.itsHalfIterationCount += std::uint64_t{2} * iterations * itsTaken;
 }
 
-void LanePath::decisions(std::uint8_t* const* blocks)
+std::size_t LanePath::blockSize() const
 {
-    itsLanes->decisions(blocks);
+    return itsLanes->cut().K();
 }
 
-void LanePath::ratios(std::int16_t* const* blocks)
+void LanePath::decisions(std::uint8_t* to)
 {
-    itsLanes->ratios(blocks);
+    setPlaces(itsDecisions, to, blockSize());
+    itsLanes->decisions(itsDecisions.data());
 }
 
-/// Of blocks of one size the last one's columns remain.
-void LanePath::keepLast()
+void LanePath::ratios(std::int16_t* to)
+{
+    setPlaces(itsRatios, to, blockSize());
+    itsLanes->ratios(itsRatios.data());
+}
+
+void LanePath::handOverLastBlock()
 {
     if (itsIterations != 0) {
-        itsPast.push_back({itsLanes->loadedBlock(itsLoaded - 1), itsLanes->cut().K(), itsIterations});
+        itsMissedBlocks.add(itsLanes->loadedBlock(itsTaken - 1), itsLanes->cut().K(), itsIterations);
         itsIterations = 0;
     }
 }
 
-TDecoder3GPU& LanePath::twin()
+void LanePath::forgetBlocks()
 {
-    if (itsTwin == nullptr) {
-        std::unique_ptr<State, Release> made(new State{});
-        made->generics = itsGenerics;
-        components::create(*made);
-        itsTwin = std::move(made);
-    }
-    return static_cast<TDecoder3GPU&>(*itsTwin->decoder);
-}
-
-void LanePath::catchUp(const State& state)
-{
-    forgetBlocksOfOthers(state);
-    keepLast();
-    if (!itsPast.empty()) {
-        computeColumns();
-        itsPast.clear();
-    }
-}
-
-/// By components that nobody has changed, and that neither count nor trace for anybody.
-void LanePath::computeColumns()
-{
-    TDecoder3GPU& made = twin();
-    const unsigned shift = made.itsEngine->itsStateFormat->itsShift;
-    const LentColumns columns(itsDecoder, made);
-    for (const Past& past : itsPast) {
-        std::vector<short> soft;
-        std::vector<unsigned char> hard;
-        for (std::size_t position = 0; position < past.input[0].size(); ++position) {
-            for (const std::vector<std::int16_t>& stream : past.input) {
-                soft.push_back(static_cast<short>(stream[position] * (1 << shift)));
-            }
-        }
-        made.decode(soft, hard, past.iterations);
-    }
-    if (itsDecoder.itsAlphaSegment.empty()) {
-        itsDecoder.itsNT = made.itsNT;
-        itsDecoder.itsBetaSegment = made.itsBetaSegment;
-        itsDecoder.itsAlphaSegment = made.itsAlphaSegment;
-    }
+    itsIterations = 0;
 }

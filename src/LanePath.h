@@ -1,99 +1,67 @@
-// LanePath: the C interface's quick way through the lane-parallel decoder, beside the components.
+// LanePath: blocks through the lane-parallel decoder, which gives what the state's components would.
 #ifndef MORVIK_SRC_LANEPATH_H
 #define MORVIK_SRC_LANEPATH_H
 
+#include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <tuple>
 #include <vector>
 
-#include "Components.h"
-#include "TDecoder3GPU.h"
+#include "BlockPath.h"
+#include "DecoderState.h"
+#include "MissedBlocks.h"
+#include "OriginalComponents.h"
 #include "lanes/InstructionSets.h"
 #include "lanes/LaneDecoder.h"
 
-/// Decodes for a decoder whose metric columns nobody watches, and keeps its counters. The columns are not
-/// computed here, but a trace shows what earlier blocks left in some of them; before the components work
-/// again, catchUp therefore computes those of the blocks whose columns would still be there.
-class LanePath {
+/// Keeps the counters of the state's decoder, which has to be the original one, and tells the missed blocks what it has
+/// decoded.
+class LanePath : public BlockPath {
 public:
-    using State = components::State;
-
-    /// The path for a state whose components have just been made.
-    LanePath(const State& state, const lanes::InstructionSet& instructionSet);
+    LanePath(veltra_ip_morvik_v1_0_state& state,
+             OriginalComponents& originals,
+             MissedBlocks& missedBlocks,
+             const lanes::InstructionSet& instructionSet);
 
     const lanes::InstructionSet& instructionSet() const;
     void setInstructionSet(const lanes::InstructionSet& instructionSet);
 
-    /// Whether the lanes decode a block of K bits as the state's components would, and nobody watches those; then
-    /// everything is ready for it. Exhausted memory throws std::bad_alloc.
-    bool takes(const State& state, unsigned K);
+    unsigned take(const simulation_call::Batch& batch, std::size_t first, unsigned most) override;
+    simulation_call::Status decode(unsigned iterations) override;
+    simulation_call::Status countErrors(unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors) override;
+    std::size_t blockSize() const override;
+    void decisions(std::uint8_t* to) override;
+    void ratios(std::int16_t* to) override;
 
-    /// Whether the state's components are those that were made with it.
-    bool knows(const State& state) const
-    {
-        return itsCreated.matches(state);
-    }
+    /// Adds the last block that was decoded to the missed ones: of blocks of one size its columns remain.
+    void handOverLastBlock();
 
-    /// The lanes' own load, decode and results, after takes.
-    unsigned blocksTaken(unsigned blocks) const;
-
-    template <class Input>
-    bool load(const lanes::Streams<Input>* blocks, unsigned count)
-    {
-        itsIterations = 0;
-        itsLoaded = itsLanes->blocksTaken(count);
-        return itsLanes->load(blocks, count);
-    }
-
-    void decode(unsigned iterations);
-
-    /// Decodes likewise and calls afterEach(t) when results of full iteration t, from 0, are there.
-    template <class AfterEach>
-    void decode(unsigned iterations, AfterEach afterEach)
-    {
-        for (unsigned t = 0; t < iterations; ++t) {
-            itsLanes->decode(2 * t, 2 * t + 2);
-            afterEach(t);
-        }
-        count(iterations);
-    }
-
-    void decisions(std::uint8_t* const* blocks);
-    void ratios(std::int16_t* const* blocks);
-
-    /// Leaves the columns of the state's decoder as they would be had it decoded everything itself.
-    void catchUp(const State& state);
+    /// The blocks that were taken last are not the decoder's.
+    void forgetBlocks();
 
 private:
-    /// A decoded block whose columns would still be there: each later one is shorter.
-    struct Past {
-        lanes::LoadedBlock input;
-        unsigned K;
-        unsigned iterations;
-    };
+    template <class Input>
+    using Blocks = std::vector<lanes::Streams<Input>>;
 
-    struct Release {
-        void operator()(State* state) const;
-    };
-
-    void forgetBlocksOfOthers(const State& state);
     void prepare(unsigned K);
-    void dropOtherTables(unsigned K);
-    bool keepsTheirTables(unsigned K);
+    template <class Input>
+    bool load(const simulation_call::Batch& batch, const lanes::Streams<Input>& all, std::size_t first, unsigned most);
+    void loadClipped(const simulation_call::Batch& batch, std::size_t first);
     void count(unsigned iterations);
-    void keepLast();
-    TDecoder3GPU& twin();
-    void computeColumns();
 
-    const components::Snapshot itsCreated;
-    const veltra_ip_morvik_v1_0_generics itsGenerics;
-    TDecoder3GPU& itsDecoder;  ///< may be used while the state still has it
+    veltra_ip_morvik_v1_0_state& itsState;
+    OriginalComponents& itsOriginals;
+    MissedBlocks& itsMissedBlocks;
     const lanes::CorrectionTable itsCorrections;
-    std::unique_ptr<State, Release> itsTwin;  ///< components that nobody changes, once there was something to catch up
     std::unique_ptr<lanes::LaneDecoder> itsLanes;
-    std::vector<Past> itsPast;
-    unsigned itsLoaded = 0;      ///< blocks
-    unsigned itsIterations = 0;  ///< that the loaded blocks were decoded with; 0: not yet
+    unsigned itsTaken = 0;       ///< blocks
+    unsigned itsIterations = 0;  ///< that these were decoded with; 0: not yet
+
+    // Where the blocks that were taken are, and where their results go: room that is kept from call to call.
+    std::tuple<Blocks<std::int32_t>, Blocks<std::int16_t>, Blocks<std::int8_t>> itsBlocks;
+    std::vector<std::uint8_t*> itsDecisions;
+    std::vector<std::int16_t*> itsRatios;
 };
 
 #endif

@@ -1,187 +1,175 @@
-// SimulationCall: what the simulation calls of the two C headers share.
+// SimulationCall: the journey of a call's blocks: checked, sent on one of the two paths, delivered.
 #include "SimulationCall.h"
 
-#include <array>
+#include <algorithm>
+#include <optional>
+#include <variant>
 
+#include "ComponentPath.h"
+#include "CoreInputs.h"
 #include "LanePath.h"
-#include "Messages.h"
-#include "lanes/Unaligned.h"
-#include "rules/Arithmetic.h"
+#include "PathChoice.h"
 
 namespace simulation_call {
 
 namespace {
 
-constexpr unsigned streamCount = 3;
-constexpr const char* streamNames[streamCount] = {"RSC1 systematic", "RSC1 parity", "RSC2 parity"};
+using State = veltra_ip_morvik_v1_0_state;
+using Outputs = veltra_ip_morvik_v1_0_batch_outputs;
 
-/// A caller's value as the input format holds it: the integer of its low bits, 24 for the hardware's
-/// format, clipped (rule 4). `excess` is what was clipped.
-std::int32_t inputInteger(std::int32_t value, const TNumberFormat& input, std::int32_t& excess)
+/// What is wrong with an output record, or null.
+const char* outputFault(const Outputs* outputs)
 {
-    const std::int32_t low = arithmetic::shiftRight(arithmetic::shiftLeftWrap(value, input.itsShift), input.itsShift);
-    const std::int32_t kept = arithmetic::clip(low, input.itsMinQ, input.itsMaxQ);
-    excess = low - kept;
-    return kept;
-}
-
-/// Reports that a value has been clipped, once in a state's life.
-void reportSaturation(State& state, unsigned stream, std::int32_t position, bool positively)
-{
-    if (state.saturation_reported) {
-        return;
+    if (outputs == nullptr) {
+        return "Simulate called with null output structure";
     }
-    messages::writeWarning("WARNING:decoder:",
-                           streamNames[stream],
-                           " value in position ",
-                           position,
-                           positively ? " saturated positively" : " saturated negatively",
-                           ", further saturation will not be reported");
-    state.saturation_reported = true;
+    return outputs->dout == nullptr ? "Simulate called with null pointer for dout" : nullptr;
 }
 
-template <class Input>
-std::array<const Input*, streamCount> inOrder(const lanes::Streams<Input>& streams)
+/// What is wrong with where the counts go, or null.
+const char* outputFault(const ErrorCounts& counts, const Batch& batch)
 {
-    return {streams.systematic, streams.parity1, streams.parity2};
+    if (counts.sent == nullptr) {
+        return "Simulate called with null pointer for sent";
+    }
+    if (counts.errors == nullptr) {
+        return "Simulate called with null pointer for errors";
+    }
+    return counts.room / std::max(batch.iterations, 1U) < batch.blocks ? "Insufficient allocated space for errors array"
+                                                                       : nullptr;
 }
 
-/// Calls use(stream, position, kept integer) for every value of a block, position by position, and reports
-/// the first that is clipped.
-template <class Input, class Use>
-void convert(State& state, const lanes::Streams<Input>& block, std::int32_t dinSize, Use use)
+const char* nullStream(const Batch& batch)
 {
-    const auto streams = inOrder(block);
-    for (std::int32_t i = 0; i < dinSize; ++i) {
-        for (unsigned s = 0; s < streamCount; ++s) {
-            std::int32_t excess = 0;
-            const auto value = std::int32_t{lanes::valueAt(streams[s], static_cast<std::size_t>(i))};
-            const std::int32_t kept = inputInteger(value, *state.input_format, excess);
-            if (excess != 0) {
-                reportSaturation(state, s, i, excess > 0);
-            }
-            use(s, i, kept);
+    const auto nullOne = [](const auto& streams) -> const char* {
+        if (streams.systematic == nullptr) {
+            return "rsc1_sys must not be a null pointer";
+        }
+        if (streams.parity1 == nullptr) {
+            return "rsc1_par must not be a null pointer";
+        }
+        return streams.parity2 == nullptr ? "rsc2_par must not be a null pointer" : nullptr;
+    };
+    return std::visit(nullOne, batch.streams);
+}
+
+/// What is wrong with the arguments of a call, the first of all, or null.
+const char* checkArguments(const State* state, const char* outputFault, const Batch& batch)
+{
+    if (state == nullptr) {
+        return "Simulate called with null state structure";
+    }
+    if (outputFault != nullptr) {
+        return outputFault;
+    }
+    if (batch.dinSize < 1) {
+        return "din_size must be a positive integer";
+    }
+    if (const char* reason = nullStream(batch)) {
+        return reason;
+    }
+    return batch.iterations < 1 || batch.iterations > 15 ? "Number of iterations must be in the range 1 to 15"
+                                                         : nullptr;
+}
+
+/// Which array of the record has no room for all that a batch of blocks of K bits delivers, or null.
+const char* shortArray(const Outputs& outputs, std::size_t blocks, std::size_t K)
+{
+    const auto lacks = [blocks](std::size_t room, std::size_t each) {
+        return each != 0 && room / each < blocks;
+    };
+    if (lacks(outputs.dout_alloc, K)) {
+        return "Insufficient allocated space for output array";
+    }
+    if (outputs.ratios != nullptr && lacks(outputs.ratios_alloc, K)) {
+        return "Insufficient allocated space for ratios array";
+    }
+    return outputs.tags != nullptr && lacks(outputs.tags_alloc, 1) ? "Insufficient allocated space for tags array"
+                                                                   : nullptr;
+}
+
+/// Lets a path take in a batch, some blocks at a time, and calls decode(path, first, taken) for each lot. The first
+/// block may be wanted as a lot of its own.
+template <class Decode>
+Status sendBy(BlockPath& path, const Batch& batch, bool firstAlone, Decode decode)
+{
+    for (std::uint32_t b = 0; b < batch.blocks;) {
+        const unsigned taken = path.take(batch, b, b == 0 && firstAlone ? 1 : batch.blocks - b);
+        if (const Status status = decode(path, b, taken); status != success) {
+            return status;
+        }
+        b += taken;
+    }
+    return success;
+}
+
+/// Sends a batch by the lanes, where they take it, else by the components, which guard their decoder alone.
+template <class Decode>
+Status send(State& state, const Batch& batch, bool firstAlone, Decode decode)
+{
+    if (batch.blocks == 0) {
+        return success;
+    }
+    const auto byLanes = guarded([&]() -> std::optional<Status> {
+        LanePath* const lanes = state.path_choice == nullptr ? nullptr : state.path_choice->lanesFor(batch.blockSize());
+        return lanes == nullptr ? std::nullopt : std::optional<Status>(sendBy(*lanes, batch, firstAlone, decode));
+    });
+    if (byLanes) {
+        return *byLanes;
+    }
+    ComponentPath components(state);
+    return sendBy(components, batch, firstAlone, decode);
+}
+
+/// Delivers what a path gives for the blocks from `first` on.
+void deliver(State& state, const Batch& batch, BlockPath& path, std::size_t first, unsigned taken, Outputs& outputs)
+{
+    const std::size_t K = path.blockSize();
+    path.decisions(outputs.dout + first * K);
+    if (outputs.ratios != nullptr) {
+        path.ratios(outputs.ratios + first * K);
+    }
+    for (std::size_t b = first; b < first + taken; ++b) {
+        const std::uint32_t kept = core_inputs::truncateTag(state, batch.tag(b));
+        if (outputs.tags != nullptr) {
+            lanes::setValueAt(outputs.tags, b, kept);
         }
     }
-}
-
-/// Calls decode(soft values) of a block for the components, and says how it ended.
-template <class Input, class Decode>
-Status withSoftValues(State& state, const lanes::Streams<Input>& streams, std::int32_t dinSize, Decode decode)
-{
-    std::vector<short> soft;
-    soft.reserve(3 * static_cast<std::size_t>(dinSize));
-    convert(state, streams, dinSize, [&](unsigned, std::int32_t, std::int32_t kept) {
-        soft.push_back(state.state_format->place(kept));
-    });
-    return guarded([&] {
-        if (state.lane_path != nullptr) {
-            state.lane_path->catchUp(state);
-        }
-        return decode(soft) ? success : decodeFailed;
-    });
+    if (first + taken == batch.blocks) {
+        outputs.dout_size = static_cast<std::uint32_t>(K);
+    }
 }
 
 }  // namespace
 
-Status refuse(const char* reason)
+/// Room is what is looked at last: where it lacks, the first block is decoded, and counts, before all are refused.
+Status simulate(State* state, const Batch& batch, Outputs* outputs)
 {
-    messages::writeError("ERROR:decoder:", reason);
-    return refused;
-}
-
-std::uint32_t truncateTag(State& state, std::uint32_t tag)
-{
-    const std::uint32_t kept = tag & state.tag_mask;
-    if (kept != tag && !state.tag_truncation_reported) {
-        messages::writeWarning("WARNING:decoder:Input block tag has been truncated to ",
-                               state.generics.C_TAG_WIDTH,
-                               " bits, further truncation will not be reported");
-        state.tag_truncation_reported = true;
+    if (const char* reason = checkArguments(state, outputFault(outputs), batch)) {
+        return refuse(reason);
     }
-    return kept;
-}
-
-template <class Input>
-Status decodeByComponents(State& state,
-                          const lanes::Streams<Input>& streams,
-                          std::int32_t dinSize,
-                          std::uint32_t iterations,
-                          std::vector<unsigned char>& hard)
-{
-    return withSoftValues(state, streams, dinSize, [&](const std::vector<short>& soft) {
-        return state.decoder->decode(soft, hard, iterations);
-    });
-}
-
-template <class Input>
-Status countByComponents(State& state,
-                         const lanes::Streams<Input>& streams,
-                         std::int32_t dinSize,
-                         const std::vector<unsigned char>& sent,
-                         std::vector<unsigned long long>& bitErrors)
-{
-    return withSoftValues(state, streams, dinSize, [&](const std::vector<short>& soft) {
-        std::vector<unsigned long long> blockErrors;
-        return state.decoder->decode(soft, sent, bitErrors, blockErrors);
-    });
-}
-
-bool lanesTake(const State& state, std::int32_t dinSize)
-{
-    return state.lane_path != nullptr && !state.by_components && dinSize > std::int32_t{lanes::tailPositions} &&
-           state.lane_path->takes(state, blockSizeOf(dinSize));
-}
-
-template <class Input>
-unsigned loadLanes(
-    State& state, const lanes::Streams<Input>* blocks, unsigned count, std::int32_t dinSize, const std::uint32_t* tags)
-{
-    LanePath& path = *state.lane_path;
-    const unsigned taken = path.blocksTaken(count);
-    if (path.load(blocks, count)) {
-        return taken;
-    }
-    const auto size = static_cast<std::size_t>(dinSize);
-    std::vector<std::int16_t> clipped(3 * size * taken);
-    std::vector<lanes::Streams<std::int16_t>> again;
-    for (unsigned b = 0; b < taken; ++b) {
-        std::int16_t* const to = clipped.data() + 3 * size * b;
-        convert(state, blocks[b], dinSize, [&](unsigned stream, std::int32_t position, std::int32_t kept) {
-            to[stream * size + static_cast<std::size_t>(position)] = static_cast<std::int16_t>(kept);
-        });
-        again.push_back({to, to + size, to + 2 * size});
-        if (tags != nullptr) {
-            truncateTag(state, lanes::valueAt(tags, b));
+    const bool firstAlone = shortArray(*outputs, batch.blocks, batch.blockSize()) != nullptr;
+    return send(*state, batch, firstAlone, [&](BlockPath& path, std::size_t first, unsigned taken) {
+        if (const Status status = path.decode(batch.iterations); status != success) {
+            return status;
         }
-    }
-    path.load(again.data(), taken);
-    return taken;
+        if (const char* reason = first == 0 ? shortArray(*outputs, batch.blocks, path.blockSize()) : nullptr) {
+            return refuse(reason);
+        }
+        deliver(*state, batch, path, first, taken, *outputs);
+        return success;
+    });
 }
 
-template Status decodeByComponents(
-    State&, const lanes::Streams<std::int32_t>&, std::int32_t, std::uint32_t, std::vector<unsigned char>&);
-template Status decodeByComponents(
-    State&, const lanes::Streams<std::int16_t>&, std::int32_t, std::uint32_t, std::vector<unsigned char>&);
-template Status decodeByComponents(
-    State&, const lanes::Streams<std::int8_t>&, std::int32_t, std::uint32_t, std::vector<unsigned char>&);
-template Status countByComponents(State&,
-                                  const lanes::Streams<std::int32_t>&,
-                                  std::int32_t,
-                                  const std::vector<unsigned char>&,
-                                  std::vector<unsigned long long>&);
-template Status countByComponents(State&,
-                                  const lanes::Streams<std::int16_t>&,
-                                  std::int32_t,
-                                  const std::vector<unsigned char>&,
-                                  std::vector<unsigned long long>&);
-template Status countByComponents(State&,
-                                  const lanes::Streams<std::int8_t>&,
-                                  std::int32_t,
-                                  const std::vector<unsigned char>&,
-                                  std::vector<unsigned long long>&);
-template unsigned loadLanes(State&, const lanes::Streams<std::int32_t>*, unsigned, std::int32_t, const std::uint32_t*);
-template unsigned loadLanes(State&, const lanes::Streams<std::int16_t>*, unsigned, std::int32_t, const std::uint32_t*);
-template unsigned loadLanes(State&, const lanes::Streams<std::int8_t>*, unsigned, std::int32_t, const std::uint32_t*);
+Status countErrors(State* state, const Batch& batch, const ErrorCounts& counts)
+{
+    if (const char* reason = checkArguments(state, outputFault(counts, batch), batch)) {
+        return refuse(reason);
+    }
+    return send(*state, batch, false, [&](BlockPath& path, std::size_t first, unsigned) {
+        return path.countErrors(
+            batch.iterations, counts.sent + first * batch.blockSize(), counts.errors + first * batch.iterations);
+    });
+}
 
 }  // namespace simulation_call

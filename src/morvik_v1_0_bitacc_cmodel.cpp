@@ -1,25 +1,19 @@
 // morvik_v1_0_bitacc_cmodel: the C interface: generics, decoder state and block simulation.
 #include "morvik_v1_0_bitacc_cmodel.h"
 
-#include <algorithm>
-#include <cstddef>
 #include <cstdlib>
-#include <optional>
-#include <vector>
 
 #include "Components.h"
 #include "DecoderState.h"
-#include "LanePath.h"
 #include "Messages.h"
+#include "PathChoice.h"
 #include "SimulationCall.h"
 
 namespace {
 
 using Generics = veltra_ip_morvik_v1_0_generics;
 using namespace simulation_call;
-using Outputs = veltra_ip_morvik_v1_0_outputs;
-
-constexpr const char* noRoom = "Insufficient allocated space for output array";
+using State = veltra_ip_morvik_v1_0_state;
 
 /// What is wrong with the generics, or null.
 const char* checkGenerics(const Generics& generics)
@@ -54,51 +48,8 @@ const char* build(State& state)
     if (const char* reason = components::create(state)) {
         return reason;
     }
-    state.lane_path = new LanePath(state, lanes::bestInstructionSet());
+    state.path_choice = new PathChoice(state, lanes::bestInstructionSet());
     return nullptr;
-}
-
-/// What one block is decoded with, and where its results go.
-struct Call {
-    lanes::Streams<std::int32_t> streams;
-    std::int32_t dinSize;
-    std::uint32_t iterations;
-    std::uint32_t tag;
-    Outputs& outputs;
-};
-
-/// Delivers all but the decisions.
-Status delivered(State& state, const Call& call, std::size_t K)
-{
-    call.outputs.dout_size = static_cast<std::uint32_t>(K);
-    call.outputs.tag = truncateTag(state, call.tag);
-    return success;
-}
-
-Status simulateByLanes(State& state, const Call& call)
-{
-    const std::size_t K = blockSizeOf(call.dinSize);
-    loadLanes(state, &call.streams, 1, call.dinSize, nullptr);
-    state.lane_path->decode(call.iterations);
-    if (call.outputs.dout_alloc < K) {
-        return refuse(noRoom);
-    }
-    state.lane_path->decisions(&call.outputs.dout);
-    return delivered(state, call, K);
-}
-
-Status simulateByComponents(State& state, const Call& call)
-{
-    std::vector<unsigned char> hard;
-    const Status status = decodeByComponents(state, call.streams, call.dinSize, call.iterations, hard);
-    if (status != success) {
-        return status;
-    }
-    if (call.outputs.dout_alloc < hard.size()) {
-        return refuse(noRoom);
-    }
-    std::copy(hard.begin(), hard.end(), call.outputs.dout);
-    return delivered(state, call, hard.size());
 }
 
 }  // namespace
@@ -163,7 +114,7 @@ void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state* state)
     if (state == nullptr) {
         return;
     }
-    delete state->lane_path;
+    delete state->path_choice;
     components::release(*state);
     std::free(state);
 }
@@ -184,12 +135,18 @@ int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state
                                               veltra_ip_morvik_v1_0_outputs* outputs)
 {
     const lanes::Streams<std::int32_t> streams = {rsc1_sys, rsc1_par, rsc2_par};
-    if (const char* reason = checkArguments(state, outputFault(outputs), streams, din_size, iterations)) {
-        return refuse(reason);
+    const Batch block = {streams, din_size, 1, iterations, &tag};
+    if (outputs == nullptr) {
+        return simulate(state, block, nullptr);
     }
-    const Call call = {streams, din_size, iterations, tag, *outputs};
-    const auto taken = guarded([&]() -> std::optional<Status> {
-        return lanesTake(*state, din_size) ? std::optional<Status>(simulateByLanes(*state, call)) : std::nullopt;
-    });
-    return taken ? *taken : simulateByComponents(*state, call);
+    veltra_ip_morvik_v1_0_batch_outputs delivered = {};
+    delivered.dout = outputs->dout;
+    delivered.dout_alloc = outputs->dout_alloc;
+    delivered.tags = &outputs->tag;
+    delivered.tags_alloc = 1;
+    const Status status = simulate(state, block, &delivered);
+    if (status == success) {
+        outputs->dout_size = delivered.dout_size;
+    }
+    return status;
 }

@@ -1,0 +1,50 @@
+// Batch: the blocks of a call, all of one size, as the caller hands them over.
+#ifndef MORVIK_SRC_BATCH_H
+#define MORVIK_SRC_BATCH_H
+
+#include <cstddef>
+#include <cstdint>
+#include <variant>
+
+#include "lanes/LaneDecoder.h"
+#include "lanes/Unaligned.h"
+#include "rules/Tail.h"
+
+namespace simulation_call {
+
+/// A single call hands over a batch of one.
+struct Batch {
+    using Streams =
+        std::variant<lanes::Streams<std::int32_t>, lanes::Streams<std::int16_t>, lanes::Streams<std::int8_t>>;
+
+    Streams streams;  ///< of all blocks, one block after the other
+    std::int32_t dinSize;
+    std::uint32_t blocks;
+    std::uint32_t iterations;
+    const std::uint32_t* tags;  ///< null: all are 0
+
+    /// K; 0 also where the positions cannot hold the tail.
+    unsigned blockSize() const
+    {
+        return dinSize < std::int32_t{morvik::rules::tailPositions}
+                   ? 0
+                   : static_cast<unsigned>(dinSize) - morvik::rules::tailPositions;
+    }
+
+    std::uint32_t tag(std::size_t block) const
+    {
+        return tags == nullptr ? 0 : lanes::valueAt(tags, block);
+    }
+
+    /// Of all blocks' streams those of one block.
+    template <class Input>
+    lanes::Streams<Input> streamsOf(const lanes::Streams<Input>& all, std::size_t block) const
+    {
+        const std::size_t first = block * static_cast<std::size_t>(dinSize);
+        return {all.systematic + first, all.parity1 + first, all.parity2 + first};
+    }
+};
+
+}  // namespace simulation_call
+
+#endif

@@ -1,0 +1,69 @@
+// PathChoice: which of its two paths the next blocks of a state take.
+#include "PathChoice.h"
+
+#include <typeinfo>
+
+namespace {
+
+/// Whether somebody traces or presets values that the lanes do not have.
+bool isWatched(const TDecoder& decoder)
+{
+    return decoder.itsDumpCount != 0 || decoder.itsTraceLevel != 0 || !decoder.itsExtrinsicIn.empty();
+}
+
+}  // namespace
+
+PathChoice::PathChoice(State& state, const lanes::InstructionSet& instructionSet)
+    : itsState(state),
+      itsOriginals(state),
+      itsMissedBlocks(itsOriginals),
+      itsLanes(state, itsOriginals, itsMissedBlocks, instructionSet)
+{
+}
+
+LanePath* PathChoice::lanesFor(unsigned K)
+{
+    if (itsComponentsAreWanted || !itsOriginals.areIn(itsState) || isWatched(*itsState.decoder) ||
+        !itsState.interleaver->valid(K)) {
+        return nullptr;
+    }
+    itsOriginals.dropTablesOfOtherSizes(K);
+    if (!itsOriginals.haveOwnTables(K)) {
+        return nullptr;
+    }
+    forgetBlocksOfOthers();
+    return &itsLanes;
+}
+
+void PathChoice::catchUp()
+{
+    forgetBlocksOfOthers();
+    itsLanes.handOverLastBlock();
+    itsMissedBlocks.computeColumns();
+}
+
+/// A decoder that a test bench has put in since, be it in the same place, has decoded nothing of what the lanes have.
+void PathChoice::forgetBlocksOfOthers()
+{
+    if (itsState.decoder != &itsOriginals.decoder() || typeid(*itsState.decoder) != typeid(TDecoder3GPU) ||
+        itsState.decoder->itsDecodeCount == 0) {
+        itsMissedBlocks.forget();
+        itsLanes.forgetBlocks();
+    }
+}
+
+const lanes::InstructionSet* PathChoice::instructionSet() const
+{
+    return !itsComponentsAreWanted && itsOriginals.areIn(itsState) ? &itsLanes.instructionSet() : nullptr;
+}
+
+void PathChoice::useLanes(const lanes::InstructionSet& instructionSet)
+{
+    itsLanes.setInstructionSet(instructionSet);
+    itsComponentsAreWanted = false;
+}
+
+void PathChoice::useComponents()
+{
+    itsComponentsAreWanted = true;
+}

@@ -1,0 +1,14 @@
+// Status: how a call of the C interface ends, and its line when it is refused.
+#include "Status.h"
+
+#include "Messages.h"
+
+namespace simulation_call {
+
+Status refuse(const char* reason)
+{
+    messages::writeError("ERROR:decoder:", reason);
+    return refused;
+}
+
+}  // namespace simulation_call
