@@ -57,7 +57,7 @@ std::string counted(std::size_t count, const std::string& noun)
 /// From dark to light over the rows, of which two are far apart.
 std::string shadeOf(unsigned row, unsigned rows)
 {
-    const double lightness = rows > 1 ? double{row} / (rows - 1) : 0;
+    const double lightness = rows > 1 ? static_cast<double>(row) / (rows - 1) : 0;
     const int dark[] = {0x1f, 0x5f, 0x99};
     const int light[] = {0xc6, 0xdd, 0xf1};
     unsigned shade[3];
