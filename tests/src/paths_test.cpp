@@ -8,6 +8,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <memory>
 #include <stdexcept>
 #include <string>
 #include <utility>
@@ -207,15 +208,20 @@ TEST(MissedBlocks, LeaveTheColumnsThatTheComponentsWouldHaveLeft)
     }
 }
 
+/// Whether or not the new one has decoded elsewhere.
 TEST(MissedBlocks, OfADecoderThatWasReplacedAreForgotten)
 {
-    const morvik::blocks::Decoder decoder(2, 1);
-    State& state = *decoder.state();
-    decode(state, 512);
-    delete state.decoder;
-    state.decoder = TDecoder::create("3GPPPU:2");
-    state.decoder->itsInterleaver = state.interleaver;
-    state.decoder->itsEngine = state.engine;
-    state.path_choice->catchUp();
-    EXPECT_EQ(state.decoder->itsAlpha, nullptr);
+    for (const std::uint64_t decoded : {0U, 1U}) {
+        const morvik::blocks::Decoder decoder(2, 1);
+        State& state = *decoder.state();
+        decode(state, 512);
+        const std::unique_ptr<TDecoder> old(state.decoder);
+        state.decoder = TDecoder::create("3GPPPU:2");
+        state.decoder->itsInterleaver = state.interleaver;
+        state.decoder->itsEngine = state.engine;
+        state.decoder->itsDecodeCount = decoded;
+        state.path_choice->catchUp();
+        EXPECT_EQ(old->itsAlpha, nullptr);
+        EXPECT_EQ(state.decoder->itsAlpha, nullptr);
+    }
 }
