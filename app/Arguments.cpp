@@ -4,9 +4,10 @@
 #include <iterator>
 #include <sstream>
 
-#include "Text.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
+#include "base/Thousandths.h"
 #include "rules/BlockSizes.h"
-#include "simulation/Thousandths.h"
 
 namespace morvik {
 
@@ -27,9 +28,9 @@ std::string wordsAsName(const std::vector<std::string>& words)
 CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max)
 {
     const auto check = [min, max](std::string& text) -> std::string {
-        const auto value = parseInteger<std::uint32_t>(text);
+        const auto value = base::parseNumber<std::uint32_t>(text);
         if (!value || *value < min || *value > max) {
-            return shown(text) + " is not allowed, allowed are the integers " + std::to_string(min) + " to " +
+            return base::shown(text) + " is not allowed, allowed are the integers " + std::to_string(min) + " to " +
                    std::to_string(max);
         }
         text = std::to_string(*value);
@@ -49,7 +50,7 @@ CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& cho
             }
             allowed += (allowed.empty() ? "" : ", ") + choice;
         }
-        return shown(text) + " is not allowed, allowed are " + allowed;
+        return base::shown(text) + " is not allowed, allowed are " + allowed;
     };
     std::vector<std::string> words;
     words.reserve(choices.size());
@@ -89,12 +90,12 @@ std::vector<std::string> offered(CLI::Option& option)
 
 void refuse(const std::string& option, const std::string& text, const std::string& allowed)
 {
-    throw CLI::ValidationError(option, shown(text) + " is not allowed, " + allowed);
+    throw CLI::ValidationError(option, base::shown(text) + " is not allowed, " + allowed);
 }
 
 void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
 {
-    const auto K = parseInteger<std::uint32_t>(text);
+    const auto K = base::parseNumber<std::uint32_t>(text);
     const auto& sizes = standard::blockSizes;
     if (!K || *K < sizes.front().K || *K > sizes.back().K) {
         refuse("--block-size", text, "allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
@@ -115,7 +116,7 @@ void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
 int readMilliDecibels(const std::string& text, const std::string& otherwise)
 {
     constexpr int largest = 50000;
-    const auto value = simulation::parseThousandths(text);
+    const auto value = base::parseThousandths(text);
     if (!value || *value < -largest || *value > largest) {
         refuse("--ebn0", text, "allowed are -50 to 50 dB, with at most three decimals" + otherwise);
     }

@@ -5,8 +5,8 @@
 #include <iostream>
 #include <string>
 
-#include "Files.h"
 #include "Notice.h"
+#include "base/Error.h"
 
 namespace morvik {
 
@@ -29,7 +29,7 @@ int reportUsage(const CLI::App& app, const CLI::ParseError& error)
 /// Whether all that was printed has arrived; what is left is lost otherwise, and nobody would know.
 int finish(const std::string& name, int status)
 {
-    return std::cout.flush() ? status : fail(name, FileError("<stdout>", cannotBe("written")).what());
+    return std::cout.flush() ? status : fail(name, base::fileError("<stdout>", "written").what());
 }
 
 int run(const CLI::App& app, const Command& command)

@@ -12,9 +12,11 @@
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
-#include "Files.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
+#include "base/Text.h"
 #include "hardware/testbench/Decoder.h"
 
 namespace morvik {
@@ -22,8 +24,8 @@ namespace morvik {
 namespace {
 
 struct Options {
-    std::string input = standardStream;
-    std::string output = standardStream;
+    std::string input = base::standardStream;
+    std::string output = base::standardStream;
     std::optional<std::string> reference;
     DecoderOptions decoder;
     std::uint32_t firstTag = 0;
@@ -55,22 +57,16 @@ struct Summary {
     }
 };
 
-/// "1 block", "2 blocks".
-std::string counted(std::uint64_t count, const std::string& noun)
-{
-    return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
-}
-
 void print(const Summary& summary, bool withErrors)
 {
-    std::cerr << counted(summary.blocks, "block") << " of ";
+    std::cerr << base::counted(summary.blocks, "block") << " of ";
     if (summary.smallest < summary.largest) {
         std::cerr << summary.smallest << " to ";
     }
     std::cerr << summary.largest << " bits";
     if (withErrors) {
-        std::cerr << ", " << counted(summary.bitErrors, "bit error") << ", "
-                  << counted(summary.blockErrors, "block error");
+        std::cerr << ", " << base::counted(summary.bitErrors, "bit error") << ", "
+                  << base::counted(summary.blockErrors, "block error");
     }
     const double seconds = std::max(summary.decoding.count(), 1e-9);  // the clock may stand still
     std::cerr.precision(2);
@@ -104,7 +100,8 @@ void decodeBlock(Decoder& decoder,
         refusal = "was refused by the decoder (" + std::string(error.what()) + ")";
     }
     if (!refusal.empty()) {
-        place.failBlock("block of " + counted(block.size(), "row") + ' ' + refusal + ", allowed are " + allowedRows);
+        place.failBlock("block of " + base::counted(block.size(), "row") + ' ' + refusal + ", allowed are " +
+                        allowedRows);
     }
 }
 
@@ -119,45 +116,56 @@ std::string decisionLine(const std::vector<std::uint8_t>& bits)
     return line + '\n';
 }
 
-/// Decodes block after block. When an input has a mistake, what comes before it is kept.
+/// Does what may find a mistake in an input. What has been decided before it is kept.
+template <class Action>
+auto keeping(base::OutputFile& output, Action action)
+try {
+    return action();
+} catch (const base::Error&) {
+    output.commit();
+    throw;
+}
+
+/// Decodes block after block.
 void decodeBlocks(const Options& options,
                   SoftValueReader& reader,
                   std::optional<ReferenceBits>& reference,
                   base::OutputFile& output,
                   Summary& summary)
-try {
+{
     // The decoder's messages must never stand between decisions.
     std::ostream& messages = output.isStandardOutput() ? std::cerr : std::cout;
     Decoder decoder(options.decoder.generics, messages);
     decoder.armTrace(options.tracedPasses);
     SoftBlock block;
     std::vector<std::uint8_t> bits;
-    while (reader.next(block)) {
+    while (keeping(output, [&] { return reader.next(block); })) {
         const auto start = std::chrono::steady_clock::now();
-        decodeBlock(decoder, reader, block, options.decoder.iterations, tagOf(summary.blocks, options), bits);
+        keeping(output, [&] {
+            decodeBlock(decoder, reader, block, options.decoder.iterations, tagOf(summary.blocks, options), bits);
+        });
         summary.decoding += std::chrono::steady_clock::now() - start;
         summary.countBlock(bits.size());
         output.write(decisionLine(bits));
         output.flush();
-        if (!messages) {
-            throw FileError(output.isStandardOutput() ? "<stderr>" : "<stdout>",
-                            "cannot be written with the decoder's messages");
-        }
-        if (reference) {
-            summary.countErrors(reference->countErrors(bits));
-        }
+        keeping(output, [&] {
+            if (!messages) {
+                throw base::Error(std::string(output.isStandardOutput() ? "<stderr>" : "<stdout>") +
+                                  ": cannot be written with the decoder's messages");
+            }
+            if (reference) {
+                summary.countErrors(reference->countErrors(bits));
+            }
+        });
     }
     output.commit();
-} catch (const FileError&) {
-    output.commit();
-    throw;
 }
 
 int decode(const Options& options)
 {
-    InputFile input(options.input);
+    base::InputFile input(options.input);
     SoftValueReader reader(input.stream(), input.name());
-    std::optional<InputFile> referenceFile;
+    std::optional<base::InputFile> referenceFile;
     std::optional<ReferenceBits> reference;
     if (options.reference) {
         referenceFile.emplace(*options.reference);
@@ -165,7 +173,7 @@ int decode(const Options& options)
     }
     const std::vector<std::string> inputs = {options.input, options.reference.value_or(options.input)};
     base::expectOwnFile(options.output, inputs, "the decisions");
-    base::expectOwnFile(standardStream, inputs, "the decoder's messages");
+    base::expectOwnFile(base::standardStream, inputs, "the decoder's messages");
     base::OutputFile output(options.output);
     Summary summary;
     decodeBlocks(options, reader, reference, output, summary);

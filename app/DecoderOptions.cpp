@@ -2,6 +2,7 @@
 #include "DecoderOptions.h"
 
 #include "Arguments.h"
+#include "base/Text.h"
 #include "simulation/Point.h"
 
 namespace morvik {
@@ -10,7 +11,7 @@ std::string coreText(const veltra_ip_morvik_v1_0_generics& generics, std::uint32
 {
     return std::to_string(generics.C_NUM_PU) + " units, " +
            simulation::algorithmName(static_cast<unsigned>(generics.C_ALGORITHM_TYPE)) + ", " +
-           std::to_string(iterations) + (iterations == 1 ? " iteration" : " iterations");
+           base::counted(iterations, "iteration");
 }
 
 std::string coreLine(const veltra_ip_morvik_v1_0_generics& generics, std::uint32_t iterations)

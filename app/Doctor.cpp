@@ -10,10 +10,10 @@
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
-#include "Files.h"
 #include "Notice.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "base/InputFile.h"
 #include "hardware/diagnosis/Diagnosis.h"
 #include "hardware/diagnosis/DiagnosisText.h"
 #include "rules/BlockSizes.h"
@@ -25,7 +25,7 @@ namespace {
 constexpr int noMistakeFound = 3;  // an exit status of this subcommand alone
 
 struct Options {
-    std::string input = standardStream;
+    std::string input = base::standardStream;
     std::string reference;
     std::uint32_t blocks = 16;
     bool json = false;
@@ -52,8 +52,8 @@ struct Cases {
 
 Cases readCases(const Options& options)
 {
-    InputFile input(options.input);
-    InputFile referenceFile(options.reference);
+    base::InputFile input(options.input);
+    base::InputFile referenceFile(options.reference);
     SoftValueReader blocks(input.stream(), input.name());
     ReferenceBits reference(referenceFile.stream(), referenceFile.name());
     std::vector<doctor::Case> cases;
@@ -72,7 +72,7 @@ Cases readCases(const Options& options)
 
 int examine(const Options& options)
 {
-    base::expectOwnFile(standardStream, {options.input, options.reference}, "findings");
+    base::expectOwnFile(base::standardStream, {options.input, options.reference}, "findings");
     const Cases read = readCases(options);
     doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
     diagnosis.hasMore = read.hasMore;

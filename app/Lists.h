@@ -8,7 +8,7 @@
 #include <string_view>
 #include <vector>
 
-#include "Text.h"
+#include "base/Shown.h"
 
 namespace morvik {
 
@@ -39,7 +39,7 @@ CLI::Option* addListOption(CLI::App& command,
             append(part, values);
             std::sort(values.begin(), values.end());
             if (std::adjacent_find(values.begin(), values.end()) != values.end()) {
-                throw CLI::ValidationError(name, shown(part) + " is not allowed, it has been given before");
+                throw CLI::ValidationError(name, base::shown(part) + " is not allowed, it has been given before");
             }
         }
     };

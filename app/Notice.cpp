@@ -3,7 +3,7 @@
 
 #include <iostream>
 
-#include "Files.h"
+#include "base/Error.h"
 #include "base/Printable.h"
 
 namespace morvik {
@@ -16,7 +16,7 @@ void notice(const std::string& line)
 void print(const std::string& text)
 {
     if (!(std::cout << base::visibleLines(text) << std::flush)) {
-        throw FileError("<stdout>", cannotBe("written"));
+        throw base::fileError("<stdout>", "written");
     }
 }
 

@@ -3,11 +3,14 @@
 
 #include <string_view>
 
-#include "Text.h"
+#include "base/Shown.h"
 
 namespace morvik {
 
-ReferenceBits::ReferenceBits(std::istream& input, const std::string& name) : itsLines(input, name) {}
+ReferenceBits::ReferenceBits(std::istream& input, const std::string& name)
+    : itsLines(input, name, base::LineReader::shortLines)
+{
+}
 
 std::vector<std::uint8_t> ReferenceBits::next()
 {
@@ -43,12 +46,13 @@ void ReferenceBits::fail(const std::string& what) const
 std::string_view ReferenceBits::nextLine()
 {
     if (!itsLines.next()) {
-        itsLines.fail("no line for block " + std::to_string(itsLines.number()) + ", expected one for each block");
+        const std::size_t missing = itsLines.number() + 1;
+        itsLines.failAt(missing, "no line for block " + std::to_string(missing) + ", expected one for each block");
     }
     const std::string_view line = itsLines.text();
     const std::size_t other = line.find_first_not_of("01");
     if (other != std::string_view::npos) {
-        itsLines.fail("character " + shown(line.substr(other, 1)) + " in column " + std::to_string(other + 1) +
+        itsLines.fail("character " + base::shown(line.substr(other, 1)) + " in column " + std::to_string(other + 1) +
                       ", allowed are 0 and 1");
     }
     return line;

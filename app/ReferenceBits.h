@@ -9,12 +9,12 @@
 #include <string_view>
 #include <vector>
 
-#include "LineReader.h"
+#include "base/LineReader.h"
 
 namespace morvik {
 
 /// Hands out the lines, or compares decisions with them, one after the other. What is wrong with a line is thrown as a
-/// FileError.
+/// base::Error.
 class ReferenceBits {
 public:
     /// `input` outlives the reader; `name` is what messages call it.
@@ -29,13 +29,13 @@ public:
     /// Throws unless all lines have been compared; blank lines at the end do not count.
     void expectEnd();
 
-    /// Throws a FileError about the line that was read last.
+    /// Throws an Error about the line that was read last.
     [[noreturn]] void fail(const std::string& what) const;
 
 private:
     std::string_view nextLine();
 
-    LineReader itsLines;
+    base::LineReader itsLines;
 };
 
 }  // namespace morvik

@@ -5,21 +5,15 @@
 #include <cstdint>
 #include <string_view>
 
-#include "Text.h"
-#include "base/Csv.h"
+#include "base/InputFile.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
+#include "base/Text.h"
 #include "rules/BlockSizes.h"
 
 namespace morvik {
 
 namespace {
-
-/// Takes the text up to the next comma, or all of it, off the front of `row`. Blanks around it do not count.
-std::string_view takeField(std::string_view& row)
-{
-    const std::string_view field = row.substr(0, row.find(','));
-    row.remove_prefix(std::min(field.size() + 1, row.size()));
-    return base::trimmed(field);
-}
 
 bool isLabel(std::string_view text)
 {
@@ -28,18 +22,19 @@ bool isLabel(std::string_view text)
 
 }  // namespace
 
-SoftValueReader::SoftValueReader(std::istream& input, const std::string& name) : itsLines(input, name)
+SoftValueReader::SoftValueReader(std::istream& input, const std::string& name)
+    : itsLines(input, name, base::LineReader::shortLines)
 {
-    const std::string header = shown(softValueHeader);
-    if (!itsLines.next()) {
+    const std::string header = base::shown(softValueHeader);
+    if (!itsRow.next()) {
         itsLines.fail("no header, expected " + header);
     }
-    if (base::fieldsOf(itsLines.text()) != base::fieldsOf(softValueHeader)) {
-        itsLines.fail("wrong header " + shown(itsLines.text()) + ", expected " + header);
+    if (!itsRow.is(softValueHeader)) {
+        itsLines.fail("wrong header " + base::shown(itsLines.text()) + ", expected " + header);
     }
     advance();
     if (itsAtEnd && !itsMistake) {
-        itsLines.fail("no rows after the header, expected at least one block");
+        itsLines.failAt(itsLines.number() + 1, "no rows after the header, expected at least one block");
     }
 }
 
@@ -50,7 +45,7 @@ bool SoftValueReader::next(SoftBlock& block)
     block.rsc2Par.clear();
     if (itsAtEnd) {
         if (itsMistake) {
-            throw FileError(*itsMistake);
+            throw base::Error(*itsMistake);
         }
         return false;
     }
@@ -69,7 +64,7 @@ bool SoftValueReader::next(SoftBlock& block)
 void SoftValueReader::failBlock(const std::string& what) const
 {
     if (itsMistake) {
-        throw FileError(*itsMistake);
+        throw base::Error(*itsMistake);
     }
     itsLines.failAt(itsFirstLine, what);
 }
@@ -77,11 +72,11 @@ void SoftValueReader::failBlock(const std::string& what) const
 void SoftValueReader::advance()
 {
     try {
-        itsAtEnd = !itsLines.next();
+        itsAtEnd = !itsRow.next();
         if (!itsAtEnd) {
             readLabel();
         }
-    } catch (const FileError& mistake) {
+    } catch (const base::Error& mistake) {
         itsMistake = mistake;
         itsAtEnd = true;
     }
@@ -94,10 +89,9 @@ void SoftValueReader::readLabel()
         itsAtEnd = true;
         return;
     }
-    std::string_view row = itsLines.text();
-    itsLabel = takeField(row);
+    itsLabel = itsRow.fields().front();
     if (!isLabel(itsLabel)) {
-        itsLines.fail("block " + shown(itsLabel) + " is no label, allowed are non-negative integers");
+        itsLines.fail("block " + base::shown(itsLabel) + " is no label, allowed are non-negative integers");
     }
 }
 
@@ -114,37 +108,35 @@ void SoftValueReader::expectOnlyBlankLines()
 
 void SoftValueReader::appendRow(SoftBlock& block) const
 {
-    std::string_view row = itsLines.text();
-    const auto fields = std::count(row.begin(), row.end(), ',') + 1;
-    if (fields != 4) {
-        itsLines.fail(std::to_string(fields) + (fields == 1 ? " field" : " fields") + ", expected the four of " +
-                      shown(softValueHeader));
+    if (itsRow.fields().size() != 4) {
+        itsLines.fail(base::counted(itsRow.fields().size(), "field") + ", expected the four of " +
+                      base::shown(softValueHeader));
     }
-    takeField(row);  // the label
-    const auto takeValue = [&](const char* column) {
-        const std::string_view field = takeField(row);
-        const auto value = parseInteger<std::int32_t>(field);
-        if (!value) {
-            itsLines.fail(std::string(column) + ' ' + shown(field) +
-                          " is not allowed, allowed are the integers -2147483648 to 2147483647");
-        }
-        return *value;
-    };
-    block.rsc1Sys.push_back(takeValue("rsc1_sys"));
-    block.rsc1Par.push_back(takeValue("rsc1_par"));
-    block.rsc2Par.push_back(takeValue("rsc2_par"));
+    block.rsc1Sys.push_back(value(1));
+    block.rsc1Par.push_back(value(2));
+    block.rsc2Par.push_back(value(3));
+}
+
+std::int32_t SoftValueReader::value(std::size_t column) const
+{
+    const std::string_view field = itsRow.fields()[column];
+    const auto value = base::parseNumber<std::int32_t>(field);
+    if (!value) {
+        itsLines.fail(std::string(base::fieldsOf(softValueHeader)[column]) + ' ' + base::shown(field) +
+                      " is not allowed, allowed are the integers -2147483648 to 2147483647");
+    }
+    return *value;
 }
 
 SoftBlock readBlock(const std::string& file, std::uint32_t number)
 {
-    InputFile input(file);
+    base::InputFile input(file);
     SoftValueReader reader(input.stream(), input.name());
     SoftBlock block;
     for (std::uint32_t i = 0; i <= number; ++i) {
         if (!reader.next(block)) {
-            throw FileError(input.name(),
-                            "has " + std::to_string(i) + (i == 1 ? " block" : " blocks") + ", there is no block " +
-                                std::to_string(number));
+            throw base::Error(input.name() + ": has " + base::counted(i, "block") + ", there is no block " +
+                              std::to_string(number));
         }
     }
     if (block.size() < rules::tailPositions ||

@@ -8,8 +8,9 @@
 #include <optional>
 #include <string>
 
-#include "Files.h"
-#include "LineReader.h"
+#include "base/Csv.h"
+#include "base/Error.h"
+#include "base/LineReader.h"
 #include "hardware/testbench/SoftBlock.h"
 
 namespace morvik {
@@ -24,7 +25,7 @@ constexpr char allowedRows[] = "K + 4 rows, K being one of the block sizes of 3G
 ///
 /// After the header, each row has four decimal integers: the label of its block, a non-negative integer of any
 /// length, and three soft values of 32 bits. A row whose label differs, as text, from that of the row before starts
-/// a new block. Blank lines are allowed at the end only. Whatever is wrong is thrown as a FileError naming the line.
+/// a new block. Blank lines are allowed at the end only. Whatever is wrong is thrown as an Error naming the line.
 class SoftValueReader {
 public:
     /// Reads the header. `input` outlives the reader; `name` is what messages call it.
@@ -40,7 +41,7 @@ public:
         return !itsAtEnd || itsMistake;
     }
 
-    /// Throws a FileError about the first line of the block just read, or about the mistake that cut it short.
+    /// Throws an Error about the first line of the block just read, or about the mistake that cut it short.
     [[noreturn]] void failBlock(const std::string& what) const;
 
 private:
@@ -49,15 +50,17 @@ private:
     void readLabel();
     void expectOnlyBlankLines();
     void appendRow(SoftBlock& block) const;
+    std::int32_t value(std::size_t column) const;
 
-    LineReader itsLines;
+    base::LineReader itsLines;
+    base::CsvReader itsRow{itsLines};
     bool itsAtEnd = false;
-    std::optional<FileError> itsMistake;
+    std::optional<base::Error> itsMistake;
     std::string itsLabel;  // of the current row, which no block has yet
     std::size_t itsFirstLine = 0;
 };
 
-/// The block of this number, from 0, in a file; "-" is the standard input. Throws a FileError where there is none, or
+/// The block of this number, from 0, in a file; "-" is the standard input. Throws an Error where there is none, or
 /// where its size is not one of the standard's.
 SoftBlock readBlock(const std::string& file, std::uint32_t number);
 

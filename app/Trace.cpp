@@ -12,19 +12,21 @@
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
-#include "Files.h"
 #include "Lists.h"
 #include "SoftValueReader.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
 #include "hardware/trace/TraceWriter.h"
-#include "simulation/Error.h"
 
 namespace morvik {
 
 namespace {
 
 struct Options {
-    std::string input = standardStream;
-    std::string output = standardStream;
+    std::string input = base::standardStream;
+    std::string output = base::standardStream;
     std::string format = "text";
     std::string halfIterations;
     std::uint32_t block = 0;
@@ -41,12 +43,12 @@ void selectPasses(const Options& options, trace::Selection& selection)
         return;
     }
     const std::vector<std::string> ends = splitAt(':', options.halfIterations);
-    const auto first = parseInteger<std::uint32_t>(ends.front());
-    const auto last = parseInteger<std::uint32_t>(ends.back());
+    const auto first = base::parseNumber<std::uint32_t>(ends.front());
+    const auto last = base::parseNumber<std::uint32_t>(ends.back());
     if (ends.size() > 2 || !first || !last || *first > *last || *last >= passes) {
-        throw simulation::Error("--half-iterations: " + shown(options.halfIterations) +
-                                " is not allowed, allowed are N and A:B, A not above B, from 0 to " +
-                                std::to_string(passes - 1) + " (two for each of --iterations)");
+        throw base::Error("--half-iterations: " + base::shown(options.halfIterations) +
+                          " is not allowed, allowed are N and A:B, A not above B, from 0 to " +
+                          std::to_string(passes - 1) + " (two for each of --iterations)");
     }
     selection.first = *first;
     selection.last = *last;
@@ -80,7 +82,7 @@ std::vector<std::string> signalWords()
 
 void appendUnit(const std::string& text, std::vector<std::uint32_t>& units)
 {
-    const auto unit = parseInteger<std::uint32_t>(text);
+    const auto unit = base::parseNumber<std::uint32_t>(text);
     if (!unit) {
         refuse("--units", text, "allowed are numbers of units, from 0");
     }
@@ -92,10 +94,10 @@ void checkUnits(const Options& options, const rules::Cut& cut)
     for (const std::uint32_t unit : options.selection.units) {
         if (unit >= cut.unitsAtWork()) {
             const std::uint32_t last = cut.unitsAtWork() - 1;
-            throw simulation::Error("--units: unit " + std::to_string(unit) + " computes nothing of a block of " +
-                                    std::to_string(cut.K()) + " bits with --num-pu " +
-                                    std::to_string(options.decoder.generics.C_NUM_PU) + ", unit" +
-                                    (last > 0 ? "s 0 to " + std::to_string(last) + " do" : " 0 does"));
+            throw base::Error("--units: unit " + std::to_string(unit) + " computes nothing of a block of " +
+                              std::to_string(cut.K()) + " bits with --num-pu " +
+                              std::to_string(options.decoder.generics.C_NUM_PU) + ", unit" +
+                              (last > 0 ? "s 0 to " + std::to_string(last) + " do" : " 0 does"));
         }
     }
 }
@@ -105,7 +107,7 @@ base::OutputFile openOutput(const Options& options)
     base::expectOwnFile(options.output, {options.input}, "its traced values");
     base::OutputFile file(options.output);
     if (options.format == "npy" && !file.isReplaced()) {
-        throw simulation::Error("--format npy needs a regular file, by --output FILE");
+        throw base::Error("--format npy needs a regular file, by --output FILE");
     }
     return file;
 }
@@ -126,7 +128,7 @@ void write(Options options)
     trace::Selection& selection = options.selection;
     selectPasses(options, selection);
     if (options.format == "text" && (!selection.signals.empty() || !selection.units.empty())) {
-        throw simulation::Error("--signals and --units need --format csv, vcd or npy: the text is the library's own");
+        throw base::Error("--signals and --units need --format csv, vcd or npy: the text is the library's own");
     }
     const SoftBlock block = readBlock(options.input, options.block);
     if (options.format == "text") {

@@ -8,14 +8,17 @@
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
-#include "Files.h"
 #include "Lists.h"
 #include "Notice.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
+#include "base/Numbers.h"
 #include "base/Printable.h"
+#include "base/Shown.h"
+#include "base/Text.h"
+#include "base/Thousandths.h"
 #include "hardware/vectors/Set.h"
-#include "simulation/Error.h"
 #include "simulation/Point.h"
-#include "simulation/Thousandths.h"
 
 namespace morvik {
 
@@ -54,7 +57,7 @@ std::string commandOf(const vectors::Settings& settings)
     command += " --iterations " + number(settings.iterations);
     command += " --tag-width " + number(settings.generics.C_TAG_WIDTH);
     command += " --blocks " + number(settings.blocks);
-    command += " --ebn0 " + simulation::thousandthsText(settings.milliDecibels);
+    command += " --ebn0 " + base::thousandthsText(settings.milliDecibels);
     command += " --seed " + number(settings.seed);
     command += settings.directed ? "" : " --no-directed";
     command += " --format " + listed(settings.formats, itself);
@@ -71,7 +74,7 @@ std::string blocksAndFormats(const vectors::Manifest& manifest)
         return format.name;
     };
     const std::size_t count = manifest.blocks.size();
-    return std::to_string(count) + (count == 1 ? " block in " : " blocks in ") + listed(manifest.formats, name);
+    return base::counted(count, "block") + " in " + listed(manifest.formats, name);
 }
 
 std::string comparedText(const vectors::Compared& compared)
@@ -88,7 +91,7 @@ int make(const Options& options)
     manifest.settings.generics = options.decoder.generics;
     manifest.settings.iterations = options.decoder.iterations;
     if (manifest.settings.blocks == 0 && !manifest.settings.directed) {
-        throw simulation::Error("--blocks 0 and --no-directed together leave no block");
+        throw base::Error("--blocks 0 and --no-directed together leave no block");
     }
     manifest.command = commandOf(manifest.settings);
     const vectors::Manifest made = vectors::makeSet(options.output, manifest);
@@ -113,7 +116,7 @@ std::vector<std::string> filesOf(const std::string& path, const vectors::Manifes
 int check(const std::string& path)
 {
     const vectors::CheckedSet set = vectors::checkSet(path);
-    base::expectOwnFile(standardStream, filesOf(path, set.manifest), "findings");
+    base::expectOwnFile(base::standardStream, filesOf(path, set.manifest), "findings");
     const std::string opening =
         coreLine(set.manifest.settings.generics, set.manifest.settings.iterations) + base::visible(path) + ": ";
     if (set.difference) {
@@ -130,7 +133,7 @@ void expectNoOtherThanCheck(const CLI::App& command)
 {
     for (const CLI::Option* const option : command.get_options()) {
         if (option->count() > 0 && option->get_name() != "--check") {
-            throw simulation::Error(option->get_name() + " is for making a set, --check takes all from the manifest");
+            throw base::Error(option->get_name() + " is for making a set, --check takes all from the manifest");
         }
     }
 }
@@ -142,7 +145,7 @@ int run(const CLI::App& command, const Options& options)
         return check(options.checked);
     }
     if (options.output.empty() || options.settings.blockSizes.empty()) {
-        throw simulation::Error(
+        throw base::Error(
             "--out and --block-size, or --check, are required; 'morvik vectors --help' tells what is allowed");
     }
     return make(options);
@@ -168,7 +171,7 @@ void addBlockOptions(CLI::App& command, vectors::Settings& settings)
         .add_option_function<std::string>(
             "--seed",
             [&settings](const std::string& text) {
-                const auto seed = parseInteger<std::uint64_t>(text);
+                const auto seed = base::parseNumber<std::uint64_t>(text);
                 if (!seed) {
                     refuse("--seed", text, "allowed are the integers from 0 to 18446744073709551615");
                 }

@@ -7,10 +7,10 @@
 
 #include "CommandLine.h"
 #include "Programs.h"
+#include "base/Error.h"
 #include "base/StandardStreams.h"
 #include "ber/BerOptions.h"
 #include "ber/Interruption.h"
-#include "simulation/Error.h"
 #include "simulation/MpiWorkers.h"
 #include "simulation/MpiWorld.h"
 
@@ -55,7 +55,7 @@ int runAsOtherRank(int argc, const char* const* argv)
         app.parse(argc, argv);
         plan = planOf(options);
     } catch (const CLI::ParseError&) {
-    } catch (const morvik::simulation::Error&) {
+    } catch (const morvik::base::Error&) {
     }
     for (const int signal : {SIGINT, SIGTERM, SIGHUP}) {
         std::signal(signal, SIG_IGN);  // rank 0 has them, too, and ends the work of all when its own is saved

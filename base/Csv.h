@@ -1,40 +1,47 @@
-// Csv: what all comma-separated values have in common, from whatever program they come.
+// Csv: comma-separated values, from whatever program they come.
 #ifndef MORVIK_BASE_CSV_H
 #define MORVIK_BASE_CSV_H
 
+#include <cstddef>
+#include <optional>
 #include <string_view>
 #include <vector>
 
+#include "LineReader.h"
+
 namespace morvik::base {
 
-/// What some programs write before a text in UTF-8.
-constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
-
-inline std::string_view withoutMark(std::string_view text)
-{
-    return text.substr(0, byteOrderMark.size()) == byteOrderMark ? text.substr(byteOrderMark.size()) : text;
-}
-
-/// The text without the blanks around it.
-inline std::string_view trimmed(std::string_view text)
-{
-    constexpr std::string_view blanks = " \t\r";
-    const std::size_t start = text.find_first_not_of(blanks);
-    return start == std::string_view::npos ? std::string_view()
-                                           : text.substr(start, text.find_last_not_of(blanks) - start + 1);
-}
-
 /// The texts between the commas, at least one, without the blanks around them.
-inline std::vector<std::string_view> fieldsOf(std::string_view line)
-{
-    std::vector<std::string_view> fields;
-    for (std::size_t comma = line.find(','); comma != std::string_view::npos; comma = line.find(',')) {
-        fields.push_back(trimmed(line.substr(0, comma)));
-        line.remove_prefix(comma + 1);
+std::vector<std::string_view> fieldsOf(std::string_view line);
+
+/// The lines of a text as rows of fields. No field has a comma: quotation marks are characters like others.
+class CsvReader {
+public:
+    /// `lines` outlive the reader.
+    explicit CsvReader(LineReader& lines) : itsLines(lines) {}
+
+    /// Goes to the next line; false at the end.
+    bool next();
+
+    /// Takes the line that `lines` have come to by themselves.
+    void takeLine();
+
+    /// The fields of the row, at least one, without the blanks around them. Valid until the next line.
+    const std::vector<std::string_view>& fields() const
+    {
+        return itsFields;
     }
-    fields.push_back(trimmed(line));
-    return fields;
-}
+
+    /// Whether the row has the fields of this line, as a header has to.
+    bool is(std::string_view line) const;
+
+    /// The first field of the row that is this text.
+    std::optional<std::size_t> find(std::string_view text) const;
+
+private:
+    LineReader& itsLines;
+    std::vector<std::string_view> itsFields;
+};
 
 }  // namespace morvik::base
 

@@ -7,7 +7,6 @@
 
 #include <atomic>
 #include <cerrno>
-#include <charconv>
 #include <cstdio>
 #include <filesystem>
 #include <iostream>
@@ -16,6 +15,7 @@
 #include <utility>
 
 #include "Error.h"
+#include "Numbers.h"
 
 namespace morvik::base {
 
@@ -38,11 +38,8 @@ struct Place {
 std::optional<int> descriptorNamed(std::string_view path)
 {
     for (const std::string_view folder : {"/dev/fd/", "/proc/self/fd/"}) {
-        int number = 0;
-        const char* const end = path.data() + path.size();
         if (path.substr(0, folder.size()) == folder) {
-            const auto result = std::from_chars(path.data() + folder.size(), end, number);
-            return result.ec == std::errc() && result.ptr == end ? std::optional<int>(number) : std::nullopt;
+            return parseNumber<int>(path.substr(folder.size()));
         }
     }
     return std::nullopt;

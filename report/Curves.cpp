@@ -6,15 +6,11 @@
 #include <utility>
 
 #include "Wording.h"
+#include "base/Text.h"
 
 namespace morvik::report {
 
 namespace {
-
-std::string counted(unsigned count, const std::string& noun)
-{
-    return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
-}
 
 std::string titleOf(const Setting& setting)
 {
@@ -25,9 +21,9 @@ std::string titleOf(const Setting& setting)
         }
     };
     append(setting.blockSize != 0, "K = " + std::to_string(setting.blockSize));
-    append(setting.numPu != 0, counted(setting.numPu, "unit"));
+    append(setting.numPu != 0, base::counted(setting.numPu, "unit"));
     append(!setting.algorithm.empty(), setting.algorithm);
-    append(setting.iterations != 0, counted(setting.iterations, "iteration"));
+    append(setting.iterations != 0, base::counted(setting.iterations, "iteration"));
     append(!setting.scale.empty() && setting.scale != "auto", "scale " + setting.scale);
     return title;
 }

@@ -5,6 +5,7 @@
 
 #include "PlotScript.h"
 #include "Wording.h"
+#include "base/Numbers.h"
 
 namespace morvik::report {
 
@@ -12,7 +13,7 @@ namespace {
 
 std::string place(double x, double y)
 {
-    return exact(x) + ',' + exact(y);
+    return base::numberText(x) + ',' + base::numberText(y);
 }
 
 const char* nameOf(Drawing::Anchor anchor)
@@ -74,8 +75,8 @@ std::string Drawing::script(const std::string& suffix) const
                        itsShapes;
     for (const Words& each : itsWords) {
         text += "set label " + quoted(each.words) + " at " + place(each.x, each.y) + ' ' + nameOf(each.anchor) +
-                " front noenhanced font '," + exact(fontSize(suffix, each.points)) + "' textcolor rgb '" + each.colour +
-                "'\n";
+                " front noenhanced font '," + base::numberText(fontSize(suffix, each.points)) + "' textcolor rgb '" +
+                each.colour + "'\n";
     }
     return text + "plot NaN notitle\n";
 }

@@ -6,12 +6,14 @@
 #include <filesystem>
 #include <locale>
 #include <sstream>
-#include <stdexcept>
 
 #include "PageParts.h"
 #include "Series.h"
 #include "Wording.h"
+#include "base/Error.h"
+#include "base/Numbers.h"
 #include "base/OutputFile.h"
+#include "base/Text.h"
 
 namespace morvik::report {
 
@@ -79,7 +81,7 @@ std::string json(const std::string& text)
 
 std::string json(double value)
 {
-    return std::isfinite(value) ? exact(value) : "null";
+    return std::isfinite(value) ? base::numberText(value) : "null";
 }
 
 std::string json(const Rate& rate)
@@ -193,17 +195,15 @@ std::string head(const std::string& title, const std::vector<View>& views)
 /// "3 curves and 2 references, 40 points".
 std::string lead(const std::vector<Curve>& curves)
 {
-    const auto counted = [](std::size_t count, const std::string& noun) {
-        return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
-    };
     std::size_t references = 0;
     std::size_t points = 0;
     for (const Curve& curve : curves) {
         references += curve.reference ? 1 : 0;
         points += curve.samples.size();
     }
-    return counted(curves.size() - references, "curve") +
-           (references > 0 ? " and " + counted(references, "reference") : "") + ", " + counted(points, "point");
+    return base::counted(curves.size() - references, "curve") +
+           (references > 0 ? " and " + base::counted(references, "reference") : "") + ", " +
+           base::counted(points, "point");
 }
 
 constexpr char figureStart[] = R"(<section id="figure" aria-labelledby="figure-title">
@@ -330,7 +330,7 @@ std::vector<Curve> numbered(const std::vector<Curve>& curves)
 void checkReport(const std::string& fileName)
 {
     if (std::filesystem::path(fileName).extension() != ".html") {
-        throw std::runtime_error(fileName + ": is no name for a report, allowed are names that end in .html");
+        throw base::Error(fileName + ": is no name for a report, allowed are names that end in .html");
     }
     base::checkWritable(fileName);
 }

@@ -17,11 +17,11 @@ struct RunDescription {
     std::string command;                                          // the command that repeats the run
 };
 
-/// Throws std::runtime_error with the reason if the file cannot be written.
+/// Throws base::Error with the reason if the file cannot be written.
 void checkReport(const std::string& fileName);
 
 /// Writes the report: the interactive curves, a table of all points, the parameters and the command. The file appears
-/// complete or not at all. Throws std::runtime_error.
+/// complete or not at all. Throws base::Error.
 void writeReport(const std::string& fileName, const std::vector<Curve>& curves, const RunDescription& run);
 
 }  // namespace morvik::report

@@ -3,13 +3,13 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <stdexcept>
 #include <system_error>
 
-#include "ChildProcess.h"
 #include "PlotScript.h"
 #include "Series.h"
 #include "Wording.h"
+#include "base/ChildProcess.h"
+#include "base/Error.h"
 #include "base/OutputFile.h"
 
 namespace morvik::report {
@@ -18,7 +18,7 @@ namespace {
 
 [[noreturn]] void fail(const std::string& fileName, const std::string& what)
 {
-    throw std::runtime_error(fileName + ": " + what);
+    throw base::Error(fileName + ": " + what);
 }
 
 /// Returns the format; throws if it is unknown.
@@ -47,7 +47,7 @@ std::string lastLine(const std::string& messages)
 std::string draw(const std::string& fileName, const std::string& script)
 {
     try {
-        Outcome outcome = runProgram({"gnuplot", "-d", "-"}, script);
+        base::Outcome outcome = base::runProgram({"gnuplot", "-d", "-"}, script);
         if (!outcome.succeeded) {
             fail(fileName, "cannot be drawn: " + lastLine(outcome.err));
         }

@@ -10,12 +10,12 @@
 
 namespace morvik::report {
 
-/// Throws std::runtime_error with the reason unless writePlot can be expected to work: the file's suffix is .svg, .png
+/// Throws base::Error with the reason unless writePlot can be expected to work: the file's suffix is .svg, .png
 /// or .pdf, its folder is writable, and the installed gnuplot supports the format.
 void checkPlot(const std::string& fileName);
 
 /// Draws BER and BLER against Eb/N0 in the format of the file's suffix, .svg, .png or .pdf. The file appears complete
-/// or not at all. Throws std::runtime_error.
+/// or not at all. Throws base::Error.
 void writePlot(const std::string& fileName, const std::vector<Curve>& curves, const std::string& title);
 
 /// The same for a drawing.

@@ -8,6 +8,7 @@
 
 #include "Series.h"
 #include "Wording.h"
+#include "base/Numbers.h"
 
 namespace morvik::report {
 
@@ -171,17 +172,17 @@ private:
 
     std::string font(int size) const
     {
-        return " font '," + exact(size * itsMeasures.font) + "'";
+        return " font '," + base::numberText(size * itsMeasures.font) + "'";
     }
 
     static std::string across(int x)
     {
-        return exact(static_cast<double>(x) / width);
+        return base::numberText(static_cast<double>(x) / width);
     }
 
     std::string up(int y) const
     {
-        return exact(1 - static_cast<double>(y) / height());
+        return base::numberText(1 - static_cast<double>(y) / height());
     }
 
     /// The data blocks of the plot commands.
@@ -221,10 +222,11 @@ private:
             if (!rate.canBeDrawn() || !std::isfinite(x)) {
                 continue;
             }
-            const std::string place = exact(x) + ' ' + exact(rate.below ? rate.high : rate.value);
+            const std::string place = base::numberText(x) + ' ' + base::numberText(rate.below ? rate.high : rate.value);
             (rate.below ? bounds : lines) += place + '\n';
             if (!rate.below && rate.hasInterval()) {
-                bars += exact(x) + ' ' + exact(std::max(rate.low, least)) + ' ' + exact(rate.high) + '\n';
+                bars += base::numberText(x) + ' ' + base::numberText(std::max(rate.low, least)) + ' ' +
+                        base::numberText(rate.high) + '\n';
             }
         }
         itsHasBars = itsHasBars || !bars.empty();
@@ -306,8 +308,8 @@ private:
                 << "set rmargin at screen " << across(right - rightMargin) << '\n'
                 << "set tmargin at screen " << up(band.top) << '\n'
                 << "set bmargin at screen " << up(band.top + panelHeight) << '\n'
-                << "set xrange [" << exact(x.from) << ':' << exact(x.to) << "]\n"
-                << "set yrange [" << exact(y.from) << ':' << exact(y.to) << "]\n"
+                << "set xrange [" << base::numberText(x.from) << ':' << base::numberText(x.to) << "]\n"
+                << "set yrange [" << base::numberText(y.from) << ':' << base::numberText(y.to) << "]\n"
                 << "set logscale y\nset mytics 10\nset format y '10^{%T}'\nset format x '%g'\n"
                 << "set xtics nomirror " << (band.axis.isWhole ? "1" : "autofreq") << "\nset ytics nomirror\n"
                 << "set label 3 '" << band.axis.label << "' at "
@@ -335,7 +337,7 @@ private:
     {
         const Look& look = band.looks[curve];
         const double lineWidth = band.curves[curve].reference ? 1.5 : 2 + 2.0 * static_cast<double>(look.layer);
-        return colourOf(band, curve) + " lw " + exact(lineWidth) + " dt " + dashType(look.dash);
+        return colourOf(band, curve) + " lw " + base::numberText(lineWidth) + " dt " + dashType(look.dash);
     }
 
     std::string pointStyle(const Band& band, std::size_t curve) const
@@ -343,7 +345,7 @@ private:
         const int open[markers] = {6, 4, 8, 12, 14};  // the next number is the filled marker
         const int marker = open[band.looks[curve].marker] + (band.curves[curve].reference ? 0 : 1);
         const double size = itsMeasures.point * (0.8 + 0.35 * static_cast<double>(band.looks[curve].layer));
-        return colourOf(band, curve) + " lw 1.5 ps " + exact(size) + " pt " + std::to_string(marker);
+        return colourOf(band, curve) + " lw 1.5 ps " + base::numberText(size) + " pt " + std::to_string(marker);
     }
 
     void writeCurve(const Band& band, const Quantity& quantity, std::size_t curve)
@@ -426,7 +428,7 @@ std::string terminalOptions(const std::string& suffix, int height)
         return " size " + std::to_string(2 * width) + ',' + std::to_string(2 * height) +
                " fontscale 2 linewidth 2 pointscale 2";
     }
-    return " size " + exact(width / 72.0) + "," + exact(height / 72.0) +  // in inches
+    return " size " + base::numberText(width / 72.0) + "," + base::numberText(height / 72.0) +  // in inches
            " fontscale 1 linewidth 1.5 pointscale 1.2";
 }
 
@@ -464,7 +466,7 @@ double fontSize(const std::string& suffix, double points)
 std::string openingCommands(const std::string& suffix, int height)
 {
     return "set encoding utf8\n" + terminalCommand(suffix) + terminalOptions(suffix, height) + " font 'sans-serif," +
-           exact(fontSize(suffix, 13)) + "'\n";
+           base::numberText(fontSize(suffix, 13)) + "'\n";
 }
 
 std::string plotScript(const std::string& suffix, const std::vector<Curve>& curves, const std::string& title)

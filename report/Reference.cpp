@@ -1,57 +1,48 @@
 // Reference: reference curves, from CSV files and results.
 #include "Reference.h"
 
-#include <charconv>
 #include <cmath>
 #include <filesystem>
 #include <optional>
 #include <sstream>
-#include <stdexcept>
 #include <string_view>
-#include <system_error>
 
-#include "Wording.h"
 #include "base/Csv.h"
+#include "base/Error.h"
+#include "base/Numbers.h"
 #include "base/Shown.h"
+#include "base/Text.h"
+#include "base/TextFile.h"
 #include "simulation/ResultFiles.h"
-#include "simulation/TextFile.h"
 
 namespace morvik::report {
 
 namespace {
 
-std::vector<std::string> fieldsOf(std::string_view line)
+/// What a file of error rates has as CSV.
+std::string csvOf(const std::string& fileName)
 {
-    const std::vector<std::string_view> fields = base::fieldsOf(line);
-    return {fields.begin(), fields.end()};
-}
-
-template <class Number>
-std::optional<Number> parsed(const std::string& text)
-{
-    Number value{};
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    return result.ec == std::errc() && result.ptr == end ? std::optional<Number>(value) : std::nullopt;
+    const bool isJson = std::filesystem::path(fileName).extension() == ".json";
+    return isJson ? csvText(simulation::readResults(fileName)) : base::readText(fileName);
 }
 
 class ReferenceReader {
 public:
-    explicit ReferenceReader(const std::string& fileName) : itsName(fileName) {}
+    explicit ReferenceReader(const std::string& fileName)
+        : itsName(fileName), itsText(csvOf(fileName)), itsLines(itsText, fileName, base::largestText)
+    {
+    }
 
     std::vector<Curve> read()
     {
-        const bool isJson = std::filesystem::path(itsName).extension() == ".json";
-        std::istringstream lines(isJson ? csvText(simulation::readResults(itsName)) : simulation::readText(itsName));
-        for (std::string line; std::getline(lines, line);) {
-            ++itsLine;
-            take(base::trimmed(line));
+        while (itsRow.next()) {
+            take(base::trimmed(itsLines.text()));
         }
         if (itsColumns.empty()) {
-            throw std::runtime_error(itsName + ": has no line that names columns");
+            throw base::Error(itsName + ": has no line that names columns");
         }
         if (itsRows.empty()) {
-            throw std::runtime_error(itsName + ": has no row of error rates");
+            throw base::Error(itsName + ": has no row of error rates");
         }
         return titled(curvesOf(itsRows));
     }
@@ -59,7 +50,7 @@ public:
 private:
     [[noreturn]] void fail(const std::string& what) const
     {
-        throw std::runtime_error(itsName + ':' + std::to_string(itsLine) + ": " + what);
+        itsLines.fail(what);
     }
 
     void take(std::string_view line)
@@ -74,21 +65,21 @@ private:
                 itsTitle = base::trimmed(comment.substr(titleMark.size()));
             }
         } else if (itsColumns.empty()) {
-            takeColumns(fieldsOf(line));
+            takeColumns(itsRow.fields());
         } else {
-            takeRow(fieldsOf(line));
+            takeRow();
         }
     }
 
-    void takeColumns(const std::vector<std::string>& names)
+    void takeColumns(const std::vector<std::string_view>& names)
     {
         constexpr std::size_t mostColumns = 1000;
         if (names.size() > mostColumns) {
             fail("names " + std::to_string(names.size()) + " columns, there may be " + std::to_string(mostColumns));
         }
-        itsColumns = names;
+        itsColumns.assign(names.begin(), names.end());
         for (std::size_t i = 0; i < names.size(); ++i) {
-            if (!names[i].empty() && indexOf(names[i]) != i) {
+            if (!names[i].empty() && indexOf(std::string(names[i])) != i) {
                 fail("column " + base::shown(names[i]) + " is there twice");
             }
         }
@@ -109,13 +100,13 @@ private:
         }
     }
 
-    void takeRow(const std::vector<std::string>& fields)
+    void takeRow()
     {
-        if (fields.size() != itsColumns.size()) {
-            fail("row of " + std::to_string(fields.size()) + " fields, there are " + std::to_string(itsColumns.size()) +
+        const std::size_t fields = itsRow.fields().size();
+        if (fields != itsColumns.size()) {
+            fail("row of " + std::to_string(fields) + " fields, there are " + std::to_string(itsColumns.size()) +
                  " columns");
         }
-        itsFields = fields;
         Row row;
         row.setting = setting();
         row.sample = sample();
@@ -197,7 +188,7 @@ private:
     std::string text(const std::string& column) const
     {
         const auto index = indexOf(column);
-        return index ? itsFields[*index] : std::string();
+        return index ? std::string(itsRow.fields()[*index]) : std::string();
     }
 
     double number(const std::string& column, double min, double max) const
@@ -206,10 +197,10 @@ private:
         if (field.empty()) {
             return unknown;
         }
-        const auto value = parsed<double>(field);
+        const auto value = base::parseNumber<double>(field);
         if (!value || !(*value >= min && *value <= max)) {
             fail(base::shown(field) + " in the column " + column + " is not allowed, allowed are numbers from " +
-                 exact(min) + " to " + exact(max));
+                 base::numberText(min) + " to " + base::numberText(max));
         }
         return *value;
     }
@@ -220,7 +211,7 @@ private:
         if (field.empty()) {
             return 0;
         }
-        const auto value = parsed<std::uint64_t>(field);
+        const auto value = base::parseNumber<std::uint64_t>(field);
         if (!value || *value > max) {
             fail(base::shown(field) + " in the column " + column + " is not allowed, allowed are the integers 0 to " +
                  std::to_string(max));
@@ -243,10 +234,11 @@ private:
     }
 
     std::string itsName;
-    std::size_t itsLine = 0;
+    std::istringstream itsText;
+    base::LineReader itsLines;
+    base::CsvReader itsRow{itsLines};
     std::string itsTitle;
     std::vector<std::string> itsColumns;
-    std::vector<std::string> itsFields;  // of the current row
     std::vector<Row> itsRows;
 };
 

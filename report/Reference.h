@@ -18,7 +18,7 @@ namespace morvik::report {
 /// separate the rows into curves (see curvesOf); other columns are ignored. A comment "# title: TEXT" names the curve,
 /// otherwise the file name does.
 ///
-/// Throws std::runtime_error with one line that begins with the place, FILE or FILE:LINE.
+/// Throws base::Error with one line that begins with the place, FILE or FILE:LINE.
 std::vector<Curve> readReference(const std::string& fileName);
 
 }  // namespace morvik::report

@@ -6,6 +6,7 @@
 #include <charconv>
 #include <cmath>
 
+#include "base/Numbers.h"
 #include "base/Printable.h"
 
 namespace morvik::report {
@@ -15,13 +16,6 @@ namespace {
 bool isContinuation(char c)
 {
     return (static_cast<unsigned char>(c) & 0xc0U) == 0x80U;
-}
-
-std::string converted(double value, std::chars_format format, int digits)
-{
-    std::array<char, 400> buffer{};  // the largest double has 309 digits before the point
-    const auto result = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value, format, digits);
-    return {buffer.data(), result.ptr};
 }
 
 }  // namespace
@@ -93,13 +87,13 @@ std::size_t characters(std::string_view text)
 std::string decibels(double value)
 {
     const bool needsThree = std::lround(value * 1000) % 10 != 0;
-    const std::string digits = converted(std::abs(value), std::chars_format::fixed, needsThree ? 3 : 2);
+    const std::string digits = base::numberText(std::abs(value), std::chars_format::fixed, needsThree ? 3 : 2);
     return std::lround(value * 1000) < 0 ? "\u2212" + digits : digits;
 }
 
 std::string rate(double value)
 {
-    return converted(value, std::chars_format::scientific, 2);
+    return base::numberText(value, std::chars_format::scientific, 2);
 }
 
 std::string grouped(std::uint64_t count)
@@ -113,13 +107,6 @@ std::string grouped(std::uint64_t count)
         result += digits[i];
     }
     return result;
-}
-
-std::string exact(double value)
-{
-    std::array<char, 40> buffer{};
-    const auto result = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value);
-    return {buffer.data(), result.ptr};
 }
 
 }  // namespace morvik::report

@@ -29,9 +29,6 @@ std::string rate(double value);
 /// A count, with its digits in groups of three separated by narrow spaces.
 std::string grouped(std::uint64_t count);
 
-/// With all the digits that a program needs; the value is finite.
-std::string exact(double value);
-
 }  // namespace morvik::report
 
 #endif

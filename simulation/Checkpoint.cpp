@@ -2,13 +2,13 @@
 #include "Checkpoint.h"
 
 #include <array>
-#include <charconv>
 #include <cstdint>
 #include <string_view>
 
-#include "Error.h"
 #include "Possible.h"
+#include "base/Error.h"
 #include "base/Json.h"
+#include "base/Numbers.h"
 
 namespace morvik::simulation {
 
@@ -24,10 +24,9 @@ std::string checksum(std::string_view text)
     for (const char c : text) {
         hash = (hash ^ static_cast<unsigned char>(c)) * 0x100000001b3;
     }
-    std::array<char, 16> digits = {};
-    const auto result = std::to_chars(digits.data(), digits.data() + digits.size(), hash, 16);
-    const std::string shortest(digits.data(), result.ptr);
-    return std::string(digits.size() - shortest.size(), '0') + shortest;
+    constexpr std::size_t digits = 16;
+    const std::string shortest = base::numberText(hash, 16);
+    return std::string(digits - shortest.size(), '0') + shortest;
 }
 
 Json jsonOf(const PointResult& point)

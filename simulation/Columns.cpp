@@ -2,40 +2,22 @@
 #include "Columns.h"
 
 #include <algorithm>
-#include <array>
 #include <charconv>
 #include <cstdint>
 #include <optional>
-#include <system_error>
 
 #include "Possible.h"
-#include "Thousandths.h"
+#include "base/Numbers.h"
+#include "base/Thousandths.h"
 #include "rules/BlockSizes.h"
 
 namespace morvik::simulation {
 
 namespace {
 
-/// Locales have no say in the numbers.
-template <class... Format>
-std::string numberText(double value, Format... format)
-{
-    std::array<char, 400> text = {};  // more than any double takes with three decimals
-    const auto result = std::to_chars(text.data(), text.data() + text.size(), value, format...);
-    return std::string(text.data(), result.ptr);
-}
-
 std::string rateText(double rate)
 {
-    return numberText(rate, std::chars_format::scientific, 6);
-}
-
-template <class Number>
-bool readNumber(std::string_view text, Number& value)
-{
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    return result.ec == std::errc() && result.ptr == end;
+    return base::numberText(rate, std::chars_format::scientific, 6);
 }
 
 template <class Value>
@@ -43,6 +25,12 @@ bool readInto(const std::optional<Value>& parsed, Value& value)
 {
     value = parsed.value_or(value);
     return parsed.has_value();
+}
+
+template <class Number>
+bool readNumber(std::string_view text, Number& value)
+{
+    return readInto(base::parseNumber<Number>(text), value);
 }
 
 bool readBlockSize(std::string_view text, ResultRow& row)
@@ -62,7 +50,7 @@ bool readIterations(std::string_view text, ResultRow& row)
 
 bool readScaleOption(std::string_view text, ResultRow& row)
 {
-    row.point.scaleOption = parseThousandths(text);
+    row.point.scaleOption = base::parseThousandths(text);
     return text == "auto" || row.point.scaleOption;
 }
 
@@ -127,11 +115,11 @@ const std::vector<Column> allColumns = {
      [](const Row& row) { return std::to_string(row.point.iterations); },
      readIterations},
     {"ebn0_db", number,
-     [](const Row& row) { return thousandthsText(row.point.milliDecibels); },
-     [](Text field, Row& row) { return readInto(parseThousandths(field), row.point.milliDecibels); }},
+     [](const Row& row) { return base::thousandthsText(row.point.milliDecibels); },
+     [](Text field, Row& row) { return readInto(base::parseThousandths(field), row.point.milliDecibels); }},
     {"scale", number,
-     [](const Row& row) { return thousandthsText(row.point.milliScale); },
-     [](Text field, Row& row) { return readInto(parseThousandths(field), row.point.milliScale); }},
+     [](const Row& row) { return base::thousandthsText(row.point.milliScale); },
+     [](Text field, Row& row) { return readInto(base::parseThousandths(field), row.point.milliScale); }},
     {"frames", text,
      [](const Row& row) { return row.frames.text(); },
      [](Text field, Row& row) { return readInto(FrameSet::parse(field), row.frames) && row.frames.size() > 0; }},
@@ -159,7 +147,7 @@ const std::vector<Column> allColumns = {
     {"clipped_fraction", number, [](const Row& row) { return rateText(clippedFraction(row)); }, skip},
     {"failed_frames", list, failuresText, readFailures},
     {"seconds", number,
-     [](const Row& row) { return numberText(row.seconds, std::chars_format::fixed, 3); },
+     [](const Row& row) { return base::numberText(row.seconds, std::chars_format::fixed, 3); },
      readSeconds},
     {"seed", number,
      [](const Row& row) { return std::to_string(row.seed); },

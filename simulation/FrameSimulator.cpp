@@ -6,7 +6,7 @@
 #include <stdexcept>
 #include <utility>
 
-#include "Thousandths.h"
+#include "base/Thousandths.h"
 
 namespace morvik::simulation {
 
@@ -98,7 +98,7 @@ void FrameSimulator::prepareFor(std::size_t point)
         next.algorithm != itsPlan.points[*itsPoint].algorithm) {
         makeDecoder(next);
     }
-    itsSource.emplace(next.blockSize, next.milliDecibels, fromThousandths(next.milliScale), itsPlan.seed);
+    itsSource.emplace(next.blockSize, next.milliDecibels, base::fromThousandths(next.milliScale), itsPlan.seed);
     itsPoint = point;
 }
 

@@ -3,25 +3,13 @@
 #include "Frames.h"
 
 #include <algorithm>
-#include <charconv>
 #include <numeric>
-#include <system_error>
 #include <utility>
+#include "base/Numbers.h"
 
 namespace morvik::simulation {
 
 namespace {
-
-std::optional<std::uint64_t> parseNumber(std::string_view text)
-{
-    std::uint64_t value = 0;
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    if (result.ec != std::errc() || result.ptr != end) {
-        return std::nullopt;
-    }
-    return value;
-}
 
 /// The ranges in ascending order, neighbours as one; nothing if some have a frame in common.
 std::optional<std::vector<FrameRange>> joinedRanges(std::vector<FrameRange> all)
@@ -48,8 +36,8 @@ std::optional<FrameRange> parseFrameRange(std::string_view text)
     if (colon == std::string_view::npos) {
         return std::nullopt;
     }
-    const auto from = parseNumber(text.substr(0, colon));
-    const auto to = parseNumber(text.substr(colon + 1));
+    const auto from = base::parseNumber<std::uint64_t>(text.substr(0, colon));
+    const auto to = base::parseNumber<std::uint64_t>(text.substr(colon + 1));
     if (!from || !to || *from >= *to) {
         return std::nullopt;
     }

@@ -6,13 +6,13 @@
 #include <system_error>
 #include <utility>
 
-#include "Error.h"
 #include "ResultFiles.h"
 #include "Resumption.h"
-#include "TextFile.h"
+#include "base/Error.h"
 #include "base/Json.h"
 #include "base/OutputFile.h"
 #include "base/Shown.h"
+#include "base/TextFile.h"
 
 namespace morvik::simulation {
 
@@ -36,7 +36,7 @@ Journal::Journal(const Plan& plan, std::string output, Earlier earlier)
     const std::string checkpointFile = checkpointName();
     itsFile.emplace(checkpointFile);
     if (itsFile->isTaken()) {
-        throw Error(itsOutput + ": another run is writing it; wait for that to end, or choose another name");
+        throw base::Error(itsOutput + ": another run is writing it; wait for that to end, or choose another name");
     }
     base::checkWritable(itsOutput);
     const bool isUnfinished = !itsFile->isNew();
@@ -119,27 +119,29 @@ std::string Journal::checkpointName() const
 void Journal::refuseIf(bool isUnfinished, bool hasResults) const
 {
     if (isUnfinished) {
-        throw Error(checkpointName() + ": holds an unfinished run; --resume goes on with it, --overwrite starts anew");
+        throw base::Error(checkpointName() +
+                          ": holds an unfinished run; --resume goes on with it, --overwrite starts anew");
     }
     if (hasResults) {
-        throw Error(itsOutput + ": is there already; --overwrite replaces it, --resume goes on with the same run");
+        throw base::Error(itsOutput +
+                          ": is there already; --overwrite replaces it, --resume goes on with the same run");
     }
 }
 
 Checkpoint Journal::resumable(const std::string& checkpointFile) const
 {
-    const auto checkpoint = parseCheckpoint(readText(checkpointFile), checkpointFile);
+    const auto checkpoint = parseCheckpoint(base::readText(checkpointFile), checkpointFile);
     if (!checkpoint) {
-        throw Error(checkpointFile + ": is damaged and cannot be resumed; --overwrite starts anew");
+        throw base::Error(checkpointFile + ": is damaged and cannot be resumed; --overwrite starts anew");
     }
     if (checkpoint->version != itsPlan.version) {
-        throw Error(checkpointFile + ": holds a run of version " + base::shown(checkpoint->version) + ", this is " +
-                    itsPlan.version + "; --overwrite starts anew");
+        throw base::Error(checkpointFile + ": holds a run of version " + base::shown(checkpoint->version) +
+                          ", this is " + itsPlan.version + "; --overwrite starts anew");
     }
     const std::string obstacles = obstaclesBetween(checkpoint->command, itsCheckpoint.command);
     if (!obstacles.empty()) {
-        throw Error(checkpointFile + ": holds a run with other parameters: " + obstacles +
-                    "; nothing but limits may change, which may grow; --overwrite starts anew");
+        throw base::Error(checkpointFile + ": holds a run with other parameters: " + obstacles +
+                          "; nothing but limits may change, which may grow; --overwrite starts anew");
     }
     return *checkpoint;
 }

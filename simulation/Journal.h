@@ -8,8 +8,8 @@
 #include <vector>
 
 #include "Checkpoint.h"
-#include "OwnFile.h"
 #include "Plan.h"
+#include "base/OwnFile.h"
 
 namespace morvik::simulation {
 
@@ -58,8 +58,8 @@ private:
     const Plan& itsPlan;
     std::string itsOutput;
     Checkpoint itsCheckpoint;
-    std::optional<OwnFile> itsFile;   // that the checkpoint is kept in
-    std::size_t itsResultsSaved = 0;  // how many points the results had when they were written last
+    std::optional<base::OwnFile> itsFile;  // that the checkpoint is kept in
+    std::size_t itsResultsSaved = 0;       // how many points the results had when they were written last
 };
 
 }  // namespace morvik::simulation

@@ -6,9 +6,9 @@
 #include <optional>
 #include <utility>
 
-#include "Error.h"
 #include "Possible.h"
-#include "Thousandths.h"
+#include "base/Error.h"
+#include "base/Thousandths.h"
 
 namespace morvik::simulation {
 
@@ -23,8 +23,8 @@ struct JoinedRow {
 std::string nameOf(const Point& point)
 {
     return "K = " + std::to_string(point.blockSize) + ", " + std::to_string(point.numPu) + " units, " +
-           algorithmName(point.algorithm) + ", scale " + thousandthsText(point.milliScale) + ", " +
-           std::to_string(point.iterations) + " iterations, " + thousandthsText(point.milliDecibels) + " dB";
+           algorithmName(point.algorithm) + ", scale " + base::thousandthsText(point.milliScale) + ", " +
+           std::to_string(point.iterations) + " iterations, " + base::thousandthsText(point.milliDecibels) + " dB";
 }
 
 /// What all rows of a run share.
@@ -57,8 +57,8 @@ private:
                              const std::string& here,
                              const std::string& there) const
     {
-        throw Error(fileName + ": has " + what + ' ' + here + ", but " + *itsFile + " has " + there +
-                    "; only results of the same " + what + " are joined");
+        throw base::Error(fileName + ": has " + what + ' ' + here + ", but " + *itsFile + " has " + there +
+                          "; only results of the same " + what + " are joined");
     }
 
     const std::string* itsFile = nullptr;
@@ -69,8 +69,8 @@ private:
 void join(const Part& part, const ResultRow& row, JoinedRow& joined)
 {
     if (!joined.row.frames.join(row.frames)) {
-        throw Error(part.fileName + ": has frames that " + *joined.file + " has, too: " + nameOf(row.point) +
-                    ", frames " + row.frames.text());
+        throw base::Error(part.fileName + ": has frames that " + *joined.file + " has, too: " + nameOf(row.point) +
+                          ", frames " + row.frames.text());
     }
     ErrorCounts& errors = joined.row.errors;
     const bool isTooMuch = row.errors.bitErrorSquares > UINT64_MAX - errors.bitErrorSquares;
@@ -78,8 +78,8 @@ void join(const Part& part, const ResultRow& row, JoinedRow& joined)
     joined.row.clipped += row.clipped;
     joined.row.seconds += row.seconds;
     if (isTooMuch || joined.row.frames.size() > mostBlocks) {
-        throw Error(part.fileName + ": has more errors or blocks, together with " + *joined.file +
-                    ", than can be counted: " + nameOf(row.point));
+        throw base::Error(part.fileName + ": has more errors or blocks, together with " + *joined.file +
+                          ", than can be counted: " + nameOf(row.point));
     }
 }
 

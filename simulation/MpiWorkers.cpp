@@ -7,8 +7,8 @@
 #include <thread>
 #include <utility>
 
-#include "Error.h"
 #include "Packing.h"
+#include "base/Error.h"
 
 namespace morvik::simulation {
 
@@ -77,7 +77,7 @@ private:
     void begin(const std::string& agreed)
     {
         if (itsPlan == nullptr || agreement(*itsPlan) != agreed) {
-            throw Error("is of another version than rank 0, or has other arguments");
+            throw base::Error("is of another version than rank 0, or has other arguments");
         }
         itsThreads = std::make_unique<ThreadWorkers>(*itsPlan, itsThreadCount, itsInstructionSet);
     }
@@ -148,7 +148,7 @@ std::optional<BatchResult> MpiWorkers::takeFromOthers()
     while (const auto message = MpiWorld::receive()) {
         Rank& rank = itsRanks[static_cast<std::size_t>(message->rank)];
         if (message->kind == MpiMessageKind::failure) {
-            throw Error("rank " + std::to_string(message->rank) + " on " + message->content);
+            throw base::Error("rank " + std::to_string(message->rank) + " on " + message->content);
         }
         if (message->kind == MpiMessageKind::forgotten) {
             rank.forgetsOut -= 1;

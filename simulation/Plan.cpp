@@ -2,15 +2,14 @@
 #include "Plan.h"
 
 #include <algorithm>
-#include <charconv>
 #include <cmath>
 #include <initializer_list>
 #include <map>
 #include <optional>
 #include <sstream>
 #include <string_view>
-#include <system_error>
 
+#include "base/Numbers.h"
 #include "base/Shown.h"
 #include "link/DefaultScale.h"
 
@@ -76,19 +75,10 @@ std::map<std::string, std::string> optionsOf(const std::string& command)
 }
 
 template <class Number>
-std::optional<Number> parsed(std::string_view text)
-{
-    Number value{};
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    return result.ec == std::errc() && result.ptr == end ? std::optional<Number>(value) : std::nullopt;
-}
-
-template <class Number>
 bool isNoLess(const std::string& now, const std::string& before)
 {
-    const auto limit = parsed<Number>(now);
-    const auto earlier = parsed<Number>(before);
+    const auto limit = base::parseNumber<Number>(now);
+    const auto earlier = base::parseNumber<Number>(before);
     return limit && earlier && *limit >= *earlier;
 }
 

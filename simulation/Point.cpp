@@ -4,7 +4,7 @@
 #include <array>
 #include <tuple>
 
-#include "Thousandths.h"
+#include "base/Thousandths.h"
 
 namespace morvik::simulation {
 
@@ -56,7 +56,7 @@ std::optional<unsigned> algorithmOf(std::string_view nameOrNumber)
 
 std::string scaleOptionText(const ScaleOption& option)
 {
-    return option ? thousandthsText(*option) : "auto";
+    return option ? base::thousandthsText(*option) : "auto";
 }
 
 }  // namespace morvik::simulation

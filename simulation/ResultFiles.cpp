@@ -7,13 +7,13 @@
 #include <vector>
 
 #include "Columns.h"
-#include "Error.h"
 #include "Possible.h"
-#include "Shown.h"
-#include "TextFile.h"
 #include "base/Csv.h"
+#include "base/Error.h"
 #include "base/Json.h"
 #include "base/OutputFile.h"
+#include "base/Shown.h"
+#include "base/TextFile.h"
 
 namespace morvik::simulation {
 
@@ -37,7 +37,7 @@ std::string headerLine()
 void readField(const Column& column, const std::string& text, ResultRow& row, const std::string& place)
 {
     if (!column.read(text, row)) {
-        throw Error(place + ": " + std::string(column.name) + ' ' + shown(text) + " is not allowed");
+        throw base::Error(place + ": " + std::string(column.name) + ' ' + base::shown(text) + " is not allowed");
     }
 }
 
@@ -45,16 +45,15 @@ void readField(const Column& column, const std::string& text, ResultRow& row, co
 void checkCounts(const ResultRow& row, const std::string& place)
 {
     if (const auto wrong = impossibleCount(row.frames, row.point.blockSize, row.errors, row.clipped)) {
-        throw Error(place + ": " + *wrong);
+        throw base::Error(place + ": " + *wrong);
     }
 }
 
-ResultRow csvRow(const std::string& line, const std::string& place)
+ResultRow csvRow(const std::vector<std::string_view>& fields, const std::string& place)
 {
-    const std::vector<std::string_view> fields = base::fieldsOf(line);
     if (fields.size() != columns().size()) {
-        throw Error(place + ": " + std::to_string(fields.size()) + " fields, expected " +
-                    std::to_string(columns().size()));
+        throw base::Error(place + ": " + std::to_string(fields.size()) + " fields, expected " +
+                          std::to_string(columns().size()));
     }
     ResultRow row;
     for (std::size_t i = 0; i < fields.size(); ++i) {
@@ -64,28 +63,17 @@ ResultRow csvRow(const std::string& line, const std::string& place)
     return row;
 }
 
-/// Reads a line, which ends in \n or \r\n.
-bool nextLine(std::istream& lines, std::string& line)
-{
-    if (!std::getline(lines, line)) {
-        return false;
-    }
-    if (!line.empty() && line.back() == '\r') {
-        line.pop_back();
-    }
-    return true;
-}
-
 Results parseCsv(const std::string& text, const std::string& fileName)
 {
-    std::istringstream lines(text);
-    std::string line;
-    if (!nextLine(lines, line) || base::fieldsOf(line) != base::fieldsOf(headerLine())) {
-        throw Error(fileName + ":1: no header of a result file, expected \"" + headerLine() + '"');
+    std::istringstream input(text);
+    base::LineReader lines(input, fileName, base::largestText);
+    base::CsvReader row(lines);
+    if (!row.next() || !row.is(headerLine())) {
+        lines.fail("no header of a result file, expected \"" + headerLine() + '"');
     }
     Results results;
-    for (std::size_t number = 2; nextLine(lines, line); ++number) {
-        results.rows.push_back(csvRow(line, fileName + ':' + std::to_string(number)));
+    while (row.next()) {
+        results.rows.push_back(csvRow(row.fields(), lines.place()));
     }
     return results;
 }
@@ -160,7 +148,7 @@ ResultFormat formatOf(const std::string& fileName)
     if (endsIn(fileName, ".json")) {
         return ResultFormat::json;
     }
-    throw Error(fileName + ": is no name for results, allowed are names that end in .csv or .json");
+    throw base::Error(fileName + ": is no name for results, allowed are names that end in .csv or .json");
 }
 
 std::string csvText(const Results& results)
@@ -202,7 +190,7 @@ void writeResults(const std::string& fileName, const Results& results)
 Results readResults(const std::string& fileName)
 {
     formatOf(fileName);  // before the file is opened
-    return parseResults(readText(fileName), fileName);
+    return parseResults(base::readText(fileName), fileName);
 }
 
 Results parseResults(const std::string& text, const std::string& fileName)

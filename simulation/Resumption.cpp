@@ -5,10 +5,10 @@
 #include <map>
 #include <optional>
 
-#include "Error.h"
 #include "FrameSimulator.h"
 #include "Possible.h"
 #include "ResultFiles.h"
+#include "base/Error.h"
 #include "base/Json.h"
 
 namespace morvik::simulation {
@@ -62,8 +62,8 @@ bool wasMetBefore(const Plan& plan, const PointResult& result, FrameSimulator& s
 
 [[noreturn]] void refuseBeyond(const PointResult& result, const std::string& fileName)
 {
-    throw Error(fileName + ": holds more of point " + std::to_string(result.number) +
-                " than the limits of this run allow; they may be larger than before, --overwrite starts anew");
+    throw base::Error(fileName + ": holds more of point " + std::to_string(result.number) +
+                      " than the limits of this run allow; they may be larger than before, --overwrite starts anew");
 }
 
 // ---- What is taken on no trust
@@ -73,13 +73,13 @@ void checkPoint(const Plan& plan, const PointResult& result, const std::string& 
 {
     const std::string place = fileName + ": point " + std::to_string(result.number);
     if (result.number >= plan.points.size()) {
-        throw Error(place + ": is none of this run");
+        throw base::Error(place + ": is none of this run");
     }
     const Point& point = plan.points[result.number];
     const Tally& tally = result.tally;
     if (tally.errors.size() != plan.countsOf(point)) {
-        throw Error(place + ": has " + std::to_string(tally.errors.size()) + " counts of errors, expected " +
-                    std::to_string(plan.countsOf(point)));
+        throw base::Error(place + ": has " + std::to_string(tally.errors.size()) + " counts of errors, expected " +
+                          std::to_string(plan.countsOf(point)));
     }
     if (tally.blocks > plan.frames.to - plan.frames.from) {
         refuseBeyond(result, fileName);
@@ -87,11 +87,11 @@ void checkPoint(const Plan& plan, const PointResult& result, const std::string& 
     const FrameSet frames({plan.frames.from, plan.frames.from + tally.blocks});
     for (const ErrorCounts& errors : tally.errors) {
         if (const auto wrong = impossibleCount(frames, point.blockSize, errors, tally.clipped)) {
-            throw Error(place + ": " + *wrong);
+            throw base::Error(place + ": " + *wrong);
         }
     }
     if (!isPossibleTime(result.seconds)) {
-        throw Error(place + ": has taken no possible time");
+        throw base::Error(place + ": has taken no possible time");
     }
     if (isBeyond(plan, result)) {
         refuseBeyond(result, fileName);
@@ -105,7 +105,8 @@ void checkOrder(const Plan& plan, const Checkpoint& checkpoint, const std::strin
     const auto checkNext = [&](const PointResult& result) {
         checkPoint(plan, result, fileName);
         if (result.number != nextPoint(plan, earlier)) {
-            throw Error(fileName + ": point " + std::to_string(result.number) + ": is not the next one of this run");
+            throw base::Error(fileName + ": point " + std::to_string(result.number) +
+                              ": is not the next one of this run");
         }
         earlier.push_back(result);
     };
@@ -116,7 +117,8 @@ void checkOrder(const Plan& plan, const Checkpoint& checkpoint, const std::strin
     for (const PointResult& result : checkpoint.begun) {
         checkPoint(plan, result, fileName);
         if (!earlier.empty() && result.number <= earlier.back().number) {
-            throw Error(fileName + ": point " + std::to_string(result.number) + ": is there twice, or out of order");
+            throw base::Error(fileName + ": point " + std::to_string(result.number) +
+                              ": is there twice, or out of order");
         }
         earlier.push_back(result);
     }
@@ -195,8 +197,8 @@ Standing standingOf(const Plan& plan, const Checkpoint& checkpoint, const std::s
     points.insert(points.end(), checkpoint.begun.begin(), checkpoint.begun.end());
     Standing standing = parted(plan, points);
     if (checkpoint.command == base::asUtf8(plan.command) && standing.ended.size() < checkpoint.ended.size()) {
-        throw Error(fileName + ": point " + std::to_string(checkpoint.ended[standing.ended.size()].number) +
-                    ": is said to have ended, but has not");
+        throw base::Error(fileName + ": point " + std::to_string(checkpoint.ended[standing.ended.size()].number) +
+                          ": is said to have ended, but has not");
     }
     return standing;
 }
@@ -206,8 +208,8 @@ Standing standingOf(const Plan& plan, const Results& results, const std::string&
     const std::string obstacle = obstacleIn(results.command, plan);
     const auto points = pointsOfComplete(plan, results);
     if (!obstacle.empty() || !points) {
-        throw Error(fileName + ": holds other results" + (obstacle.empty() ? "" : " (" + obstacle + ')') +
-                    ", and there is no checkpoint to resume; --overwrite starts anew");
+        throw base::Error(fileName + ": holds other results" + (obstacle.empty() ? "" : " (" + obstacle + ')') +
+                          ", and there is no checkpoint to resume; --overwrite starts anew");
     }
     FrameSimulator simulator(plan, "");
     for (const PointResult& point : *points) {

@@ -7,8 +7,8 @@
 #include <system_error>
 #include <utility>
 
-#include "Error.h"
 #include "FrameSimulator.h"
+#include "base/Error.h"
 
 namespace morvik::simulation {
 
@@ -22,7 +22,7 @@ ThreadWorkers::ThreadWorkers(const Plan& plan, unsigned threads, const std::stri
         }
     } catch (const std::system_error& error) {
         endThreads();
-        throw Error(std::to_string(useful) + " threads cannot be started: " + error.code().message());
+        throw base::Error(std::to_string(useful) + " threads cannot be started: " + error.code().message());
     }
 }
 

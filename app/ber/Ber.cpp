@@ -14,10 +14,12 @@
 #include "LiveTable.h"
 #include "Notice.h"
 #include "Pictures.h"
-#include "Text.h"
+#include "base/Error.h"
+#include "base/Numbers.h"
 #include "base/OutputFile.h"
+#include "base/Shown.h"
+#include "base/Text.h"
 #include "hardware/testbench/Decoder.h"
-#include "simulation/Error.h"
 #include "simulation/Journal.h"
 #include "simulation/Replay.h"
 #include "simulation/Run.h"
@@ -66,7 +68,7 @@ void checkInstructionSet(const std::string& name)
     if (name.empty() || hasInstructionSet(name)) {
         return;
     }
-    std::string message = "--instruction-set: " + shown(name) + " is not allowed, this machine has";
+    std::string message = "--instruction-set: " + base::shown(name) + " is not allowed, this machine has";
     const char* separator = " ";
     for (const char* const each : {"avx512", "avx2", "ssse3", "generic", "component"}) {
         if (hasInstructionSet(each)) {
@@ -74,7 +76,7 @@ void checkInstructionSet(const std::string& name)
             separator = ", ";
         }
     }
-    throw simulation::Error(message);
+    throw base::Error(message);
 }
 
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
@@ -115,8 +117,8 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
 int replayFrame(const BerOptions& options, const simulation::Plan& plan, const ReplayedFrame& replayed)
 {
     if (replayed.point >= plan.points.size()) {
-        throw simulation::Error("--replay: there is no point " + std::to_string(replayed.point) + ", the last one is " +
-                                std::to_string(plan.points.size() - 1));
+        throw base::Error("--replay: there is no point " + std::to_string(replayed.point) + ", the last one is " +
+                          std::to_string(plan.points.size() - 1));
     }
     const auto [softValues, sentBits, wrongBits] =
         simulation::replay(plan, replayed.point, replayed.frame, options.instructionSet);
@@ -127,8 +129,8 @@ int replayFrame(const BerOptions& options, const simulation::Plan& plan, const R
     base::writeFile(name + ".bits", sentBits);
 
     const simulation::Point& point = plan.points[replayed.point];
-    print(std::to_string(wrongBits) + (wrongBits == 1 ? " wrong bit\n" : " wrong bits\n") + "morvik decode " + name +
-          ".csv --reference " + name + ".bits --num-pu " + std::to_string(point.numPu) + " --algorithm " +
+    print(base::counted(wrongBits, "wrong bit") + '\n' + "morvik decode " + name + ".csv --reference " + name +
+          ".bits --num-pu " + std::to_string(point.numPu) + " --algorithm " +
           simulation::algorithmName(point.algorithm) + " --iterations " + std::to_string(point.iterations) + '\n');
     return success;
 }

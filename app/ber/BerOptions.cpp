@@ -3,25 +3,24 @@
 
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <functional>
-#include <system_error>
 #include <utility>
 #include <vector>
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
 #include "Lists.h"
-#include "Text.h"
-#include "simulation/Error.h"
-#include "simulation/Thousandths.h"
+#include "base/Error.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
+#include "base/Thousandths.h"
 
 namespace morvik {
 
 namespace {
 
-using simulation::parseThousandths;
-using simulation::thousandthsText;
+using base::parseThousandths;
+using base::thousandthsText;
 
 constexpr std::uint64_t defaultBlockErrors = 100;
 constexpr std::uint64_t defaultMaxBlocks = 1000000;
@@ -63,7 +62,7 @@ void appendScale(const std::string& text, std::vector<simulation::ScaleOption>& 
 
 void appendIterations(const std::string& text, std::vector<unsigned>& values)
 {
-    const auto iterations = parseInteger<std::uint32_t>(text);
+    const auto iterations = base::parseNumber<std::uint32_t>(text);
     if (!iterations || *iterations < 1 || *iterations > 15) {
         refuse("--iterations", text, "allowed are the integers 1 to 15");
     }
@@ -103,22 +102,11 @@ void appendEbn0(const std::string& text, std::vector<int>& values)
 std::function<void(const std::string&)> countInto(const std::string& option, std::optional<std::uint64_t>& count)
 {
     return [option, &count](const std::string& text) {
-        count = parseInteger<std::uint64_t>(text);
+        count = base::parseNumber<std::uint64_t>(text);
         if (!count || *count == 0) {
             refuse(option, text, "allowed are the integers from 1 on");
         }
     };
-}
-
-std::optional<double> parseReal(std::string_view text)
-{
-    double value = 0;
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    if (result.ec != std::errc() || result.ptr != end) {
-        return std::nullopt;
-    }
-    return value;
 }
 
 /// Reads 90, 90s, 1.5m or 2h.
@@ -133,7 +121,7 @@ double parseSeconds(const std::string& option, const std::string& text)
             break;
         }
     }
-    const auto value = parseReal(number);
+    const auto value = base::parseNumber<double>(number);
     if (!value || !(*value > 0 && *value < 1e9)) {
         refuse(option, text, "allowed are numbers above 0, of seconds, or with s, m or h after them");
     }
@@ -142,7 +130,7 @@ double parseSeconds(const std::string& option, const std::string& text)
 
 double parseStopBler(const std::string& text)
 {
-    const auto value = parseReal(text);
+    const auto value = base::parseNumber<double>(text);
     if (!value || !(*value >= 0 && *value <= 1)) {
         refuse("--stop-bler", text, "allowed are the numbers from 0 to 1");
     }
@@ -161,18 +149,12 @@ simulation::FrameRange parseFrames(const std::string& text)
 ReplayedFrame parseReplay(const std::string& text)
 {
     const std::vector<std::string> parts = splitAt(':', text);
-    const auto point = parseInteger<std::uint32_t>(parts.front());
-    const auto frame = parseInteger<std::uint64_t>(parts.back());
+    const auto point = base::parseNumber<std::uint32_t>(parts.front());
+    const auto frame = base::parseNumber<std::uint64_t>(parts.back());
     if (parts.size() != 2 || !point || !frame) {
         refuse("--replay", text, "allowed is POINT:FRAME, two integers as in the results");
     }
     return {*point, *frame};
-}
-
-std::string realText(double value)
-{
-    std::array<char, 32> text = {};
-    return std::string(text.data(), std::to_chars(text.data(), text.data() + text.size(), value).ptr);
 }
 
 // ---- The options in groups
@@ -249,7 +231,7 @@ void addRuleOptions(CLI::App& command, BerOptions& options)
         .add_option_function<std::string>(
             "--seed",
             [&options](const std::string& text) {
-                const auto seed = parseInteger<std::uint64_t>(text);
+                const auto seed = base::parseNumber<std::uint64_t>(text);
                 if (!seed) {
                     refuse("--seed", text, "allowed are the integers 0 to 18446744073709551615");
                 }
@@ -359,9 +341,9 @@ std::string commandOf(const BerOptions& options, const simulation::StopRules& ru
     addCount("--bit-errors", rules.bitErrors);
     addCount("--max-blocks", rules.maxBlocks);
     if (rules.maxSeconds) {
-        add("--max-time", realText(*rules.maxSeconds));
+        add("--max-time", base::numberText(*rules.maxSeconds));
     }
-    add("--stop-bler", realText(rules.stopBler));
+    add("--stop-bler", base::numberText(rules.stopBler));
     if (options.frames) {
         add("--frames", std::to_string(options.frames->from) + ':' + std::to_string(options.frames->to));
     }
@@ -406,12 +388,12 @@ void addBerOptions(CLI::App& command, BerOptions& options)
 simulation::Plan planOf(const BerOptions& options)
 {
     if (options.eachIteration && options.sweep.iterations.size() > 1) {
-        throw simulation::Error("--each-iteration counts up to one number of --iterations, give only the largest");
+        throw base::Error("--each-iteration counts up to one number of --iterations, give only the largest");
     }
     const std::uint64_t points = simulation::countOfPoints(options.sweep);
     if (points > mostPoints) {
-        throw simulation::Error("the lists combine to " + std::to_string(points) + " points, a run has " +
-                                std::to_string(mostPoints) + " at most");
+        throw base::Error("the lists combine to " + std::to_string(points) + " points, a run has " +
+                          std::to_string(mostPoints) + " at most");
     }
     simulation::Plan plan;
     plan.points = simulation::pointsOf(options.sweep);

@@ -11,10 +11,12 @@
 #include <stdexcept>
 #include <string_view>
 
+#include "base/Error.h"
+#include "base/Text.h"
+#include "base/Thousandths.h"
 #include "simulation/Confidence.h"
 #include "simulation/Results.h"
 #include "simulation/StopRules.h"
-#include "simulation/Thousandths.h"
 
 namespace morvik {
 
@@ -95,7 +97,7 @@ Line lineOf(const ResultRow& row, bool eachIteration)
     if (eachIteration) {
         line.iterations = std::to_string(row.point.iterations);
     }
-    line.ebn0 = simulation::thousandthsText(row.point.milliDecibels);
+    line.ebn0 = base::thousandthsText(row.point.milliDecibels);
     line.blocks = std::to_string(blocks);
     line.failed = std::to_string(row.errors.blockErrors);
     line.bler = rate(simulation::blockErrorRate(row));
@@ -169,12 +171,10 @@ void LiveTable::writeHeading(const Point& point)
         return;
     }
     eraseMovingLine();
-    const std::string iterations =
-        std::to_string(point.iterations) + (point.iterations == 1 ? " iteration" : " iterations");
     write((itsHeading ? "\nK = " : "K = ") + std::to_string(point.blockSize) + ", " + std::to_string(point.numPu) +
           " units, " + simulation::algorithmName(point.algorithm) + ", scale " +
-          simulation::scaleOptionText(point.scaleOption) + ", " + iterations + '\n' + headLine(itsPlan.eachIteration) +
-          '\n');
+          simulation::scaleOptionText(point.scaleOption) + ", " + base::counted(point.iterations, "iteration") + '\n' +
+          headLine(itsPlan.eachIteration) + '\n');
     itsHeading = point;
 }
 

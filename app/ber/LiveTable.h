@@ -17,7 +17,7 @@ namespace morvik {
 std::optional<std::size_t> terminalWidth();
 
 /// Writes a heading for each curve and a row for each ended point; with a width, also a moving line that fits into it.
-/// Throws std::runtime_error when the table cannot be written.
+/// Throws base::Error when the table cannot be written.
 class LiveTable : public simulation::Progress {
 public:
     /// Plan and stream outlive the table.

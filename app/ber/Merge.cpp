@@ -4,12 +4,11 @@
 #include <iostream>
 #include <memory>
 #include <set>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
 #include "Pictures.h"
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "simulation/Merge.h"
 #include "simulation/ResultFiles.h"
 
@@ -29,7 +28,7 @@ void write(const Options& options, const simulation::Results& results)
     if (!options.output.empty()) {
         simulation::writeResults(options.output, results);
     } else if (!options.pictures.isAskedFor() && !(std::cout << simulation::csvText(results) << std::flush)) {
-        throw std::runtime_error("<stdout>: cannot be written");
+        throw base::Error("<stdout>: cannot be written");
     }
 }
 
@@ -51,7 +50,7 @@ int merge(const Options& options)
     }
     const simulation::Results results = simulation::merge(parts);
     if (options.pictures.isAskedFor() && results.rows.empty()) {
-        throw simulation::Error("there are no points to draw");
+        throw base::Error("there are no points to draw");
     }
     write(options, results);
     if (!results.rows.empty()) {

@@ -5,12 +5,12 @@
 #include <iterator>
 #include <utility>
 
+#include "base/Error.h"
 #include "base/OutputFile.h"
+#include "base/Thousandths.h"
 #include "report/Page.h"
 #include "report/Plot.h"
 #include "report/Reference.h"
-#include "simulation/Error.h"
-#include "simulation/Thousandths.h"
 
 namespace morvik {
 
@@ -50,15 +50,15 @@ std::string rangeText(const std::vector<simulation::ResultRow>& rows)
     const auto [least, most] = std::minmax_element(rows.begin(), rows.end(), [](const auto& a, const auto& b) {
         return a.point.milliDecibels < b.point.milliDecibels;
     });
-    return simulation::thousandthsText(least->point.milliDecibels) + " to " +
-           simulation::thousandthsText(most->point.milliDecibels) + " dB";
+    return base::thousandthsText(least->point.milliDecibels) + " to " +
+           base::thousandthsText(most->point.milliDecibels) + " dB";
 }
 
 /// Throws Error if what is written to the one file, if any, would take the place of the other.
 void checkDistinct(const std::string& file, const std::string& other)
 {
     if (!file.empty() && !other.empty() && base::isSamePlace(file, other)) {
-        throw simulation::Error(file + ": is the same file as " + other + ", each output needs its own");
+        throw base::Error(file + ": is the same file as " + other + ", each output needs its own");
     }
 }
 

@@ -31,10 +31,10 @@ void addPictureOptions(CLI::App& command, PictureOptions& options);
 class Pictures {
 public:
     /// Reads the references and finds out whether the files can be written, before a long run, and beside the file of
-    /// the results, if there is one; none of them may be one of the inputs. Throws std::runtime_error.
+    /// the results, if there is one; none of them may be one of the inputs. Throws base::Error.
     Pictures(const PictureOptions& options, const std::string& output, std::vector<std::string> inputs);
 
-    /// Draws the results, of which there are some. `points` tells how many they are. Throws std::runtime_error.
+    /// Draws the results, of which there are some. `points` tells how many they are. Throws base::Error.
     void draw(const simulation::Results& results, const std::string& points) const;
 
 private:

@@ -8,17 +8,17 @@
 
 #include "Arguments.h"
 #include "DecoderOptions.h"
-#include "Files.h"
 #include "Notice.h"
 #include "OtherRuns.h"
 #include "SoftValueReader.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
 #include "hardware/comparison/Comparison.h"
 #include "hardware/comparison/Coverage.h"
 #include "hardware/comparison/Dump.h"
 #include "hardware/comparison/Model.h"
 #include "hardware/comparison/NameMap.h"
 #include "hardware/comparison/Report.h"
-#include "simulation/Error.h"
 
 namespace morvik {
 
@@ -40,7 +40,7 @@ comparison::NameMap readMap(const std::string& file)
     if (file.empty()) {
         return {};
     }
-    InputFile input(file);
+    base::InputFile input(file);
     return comparison::readNameMap(input.stream(), input.name());
 }
 
@@ -56,21 +56,21 @@ bool isVcd(const Options& options)
 
 int compare(const Options& options)
 {
-    base::expectOwnFile(standardStream, {options.block, options.dump, options.map}, "reports");
+    base::expectOwnFile(base::standardStream, {options.block, options.dump, options.map}, "reports");
     const ComparedRun run = {
         options.block, options.number, readBlock(options.block, options.number), options.decoder.generics};
     const comparison::NameMap map = readMap(options.map);
     const comparison::Model model =
         comparison::computeModel(run.block, run.generics, options.decoder.iterations, std::cerr);
     comparison::Dump dump(model.values.passes(), model.values.steps());
-    InputFile input(options.dump);
+    base::InputFile input(options.dump);
     (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);
     using comparison::Unknown;
     const comparison::Comparison found =
         comparison::compare(model, dump.values, options.ignoreUnknown ? Unknown::isIgnored : Unknown::differs);
     if (found.compared() == 0) {
-        throw FileError(input.name(),
-                        found.unknown() > 0 ? "holds no known value" : "holds no value that the core computes");
+        throw base::Error(input.name() +
+                          (found.unknown() > 0 ? ": holds no known value" : ": holds no value that the core computes"));
     }
     const comparison::Coverage coverage = comparison::coverageOf(model, dump);
     // Few values may agree with another run by chance.

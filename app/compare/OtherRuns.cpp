@@ -5,8 +5,9 @@
 #include <system_error>
 #include <vector>
 
-#include "Files.h"
 #include "SoftValueReader.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
 #include "hardware/comparison/Model.h"
 #include "hardware/diagnosis/Mistakes.h"
 #include "simulation/Point.h"
@@ -62,7 +63,7 @@ std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Va
         return found;  // it can be read but once
     }
     try {
-        InputFile input(run.file);
+        base::InputFile input(run.file);
         SoftValueReader reader(input.stream(), input.name());
         SoftBlock block;
         for (std::uint32_t number = 0; reader.next(block) && found.size() < mostBlocks; ++number) {
@@ -71,7 +72,7 @@ std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Va
                 found.push_back("of block " + std::to_string(number) + " of " + run.file);
             }
         }
-    } catch (const FileError&) {
+    } catch (const base::Error&) {
         // What follows the block in the file need not be blocks.
     }
     return found;

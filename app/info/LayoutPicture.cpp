@@ -4,6 +4,7 @@
 #include <cmath>
 #include <cstdio>
 #include <string>
+#include "base/Text.h"
 
 namespace morvik {
 
@@ -47,11 +48,6 @@ std::vector<Panel> panelsOf(const BlockLayout& layout)
         }
     }
     return panels;
-}
-
-std::string counted(std::size_t count, const std::string& noun)
-{
-    return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
 }
 
 /// From dark to light over the rows, of which two are far apart.
@@ -150,8 +146,8 @@ std::string headingOf(const Panel& panel)
     if (last != std::string::npos) {
         units.replace(last, 2, " and ");
     }
-    return units + " units: " + counted(cut.segments(), "segment") + " of " +
-           counted(cut.segmentLength(), "trellis step") + ", " + counted(cut.rows(), "row") + " of windows";
+    return units + " units: " + base::counted(cut.segments(), "segment") + " of " +
+           base::counted(cut.segmentLength(), "trellis step") + ", " + base::counted(cut.rows(), "row") + " of windows";
 }
 
 }  // namespace

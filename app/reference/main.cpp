@@ -2,13 +2,12 @@
 //   morvik_reference FOLDER     writes FOLDER/PROGRAM/share/..., as it is to be installed
 #include <exception>
 #include <filesystem>
-#include <fstream>
 #include <iostream>
-#include <stdexcept>
 
 #include "Completion.h"
 #include "ManualPage.h"
 #include "Programs.h"
+#include "base/OutputFile.h"
 
 namespace {
 
@@ -17,9 +16,9 @@ namespace fs = std::filesystem;
 void write(const fs::path& file, const std::string& text)
 {
     fs::create_directories(file.parent_path());
-    if (!(std::ofstream(file, std::ios::binary) << text << std::flush)) {
-        throw std::runtime_error(file.string() + ": cannot be written");
-    }
+    morvik::base::OutputFile output(file);
+    output.write(text);
+    output.commit();
 }
 
 void writeReference(const fs::path& folder, const morvik::Program& program)

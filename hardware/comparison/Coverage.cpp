@@ -2,6 +2,7 @@
 #include "Coverage.h"
 
 #include <algorithm>
+#include "base/Text.h"
 
 namespace morvik::comparison {
 
@@ -81,11 +82,6 @@ std::string signalNames(const std::vector<unsigned>& signals)
     return listed(signals, name, inRow);
 }
 
-std::string plural(const char* noun, std::uint64_t count)
-{
-    return noun + std::string(count == 1 ? " " : "s ");
-}
-
 }  // namespace
 
 Coverage coverageOf(const Model& model, const Dump& dump)
@@ -124,17 +120,18 @@ std::vector<std::string> lacksOf(const Coverage& coverage)
         const auto number = [](unsigned pass) {
             return std::to_string(pass);
         };
-        lacks.push_back(plural("half-iteration", coverage.absentPasses.size()) +
+        lacks.push_back(base::plural("half-iteration", coverage.absentPasses.size()) + ' ' +
                         listed(coverage.absentPasses, number, [](unsigned) { return true; }));
     }
     if (coverage.firstGap) {
         const Place& first = *coverage.firstGap;
-        lacks.push_back(std::to_string(coverage.gaps) + ' ' + plural("value", coverage.gaps) + "of " +
-                        signalNames(coverage.gapSignals) + "; the first is " + passSignals[first.signal] +
-                        " of half-iteration " + std::to_string(first.pass) + ", step " + std::to_string(first.step));
+        lacks.push_back(base::counted(coverage.gaps, "value") + " of " + signalNames(coverage.gapSignals) +
+                        "; the first is " + passSignals[first.signal] + " of half-iteration " +
+                        std::to_string(first.pass) + ", step " + std::to_string(first.step));
     }
     if (!coverage.absentSignals.empty()) {
-        lacks.push_back(plural("signal", coverage.absentSignals.size()) + signalNames(coverage.absentSignals));
+        lacks.push_back(base::plural("signal", coverage.absentSignals.size()) + ' ' +
+                        signalNames(coverage.absentSignals));
     }
     for (const unsigned signal : coverage.copiedSignals) {
         lacks.push_back(std::string("signal ") + passSignals[signal] + ", which is always " +

@@ -9,21 +9,13 @@
 #include "Dump.h"
 #include "DumpFile.h"
 #include "base/Csv.h"
-#include "simulation/Shown.h"
+#include "base/Shown.h"
 
 namespace morvik::comparison {
 
 namespace {
 
-using simulation::shown;
-
-using Fields = std::vector<std::string_view>;
-
-std::optional<std::size_t> findColumn(const Fields& header, std::string_view name)
-{
-    const auto found = std::find(header.begin(), header.end(), name);
-    return found == header.end() ? std::nullopt : std::optional(static_cast<std::size_t>(found - header.begin()));
-}
+using base::shown;
 
 /// Whether a simulator writes a value of unknown bits so: as x, or with digits of x, z, u or w, "xxx", "0x7x", "zz01",
 /// "UUUU"; VHDL has - as well.
@@ -48,13 +40,12 @@ public:
         if (!itsMap.valid.empty()) {
             itsFile.failAsAWhole("is CSV, of which all rows count; \"valid\" in a map is for VCD");
         }
-        if (!itsFile.next()) {
+        if (!itsRow.next()) {
             itsFile.fail("no header, expected the columns half_iteration, step, signal, value");
         }
-        itsRow = base::fieldsOf(itsFile.line());
         readHeader();
         while (itsFile.nextFilled()) {
-            itsRow = base::fieldsOf(itsFile.line());
+            itsRow.takeLine();
             readRow();
         }
         itsFile.expectNoneLacking(itsLacking, itsMap);
@@ -71,17 +62,17 @@ private:
     {
         itsPass = needColumn(itsMap.passColumn);
         itsStep = needColumn(itsMap.stepColumn);
-        itsFields = itsRow.size();
-        itsSignal = findColumn(itsRow, itsMap.signalColumn);
+        itsFields = itsRow.fields().size();
+        itsSignal = itsRow.find(itsMap.signalColumn);
         if (itsSignal || itsMap.namesRows) {
             itsSignal = needColumn(itsMap.signalColumn);
             itsValue = needColumn(itsMap.valueColumn);
             return;
         }
         for (std::size_t i = 0; i < itsFields; ++i) {
-            const auto signal = signalOf(itsRow[i]);
+            const auto signal = signalOf(itsRow.fields()[i]);
             if (signal && *signal != NameMap::leftOut) {
-                addColumn(std::string(itsRow[i]), *signal, i);
+                addColumn(std::string(itsRow.fields()[i]), *signal, i);
             }
         }
         if (itsColumns.empty()) {
@@ -112,39 +103,40 @@ private:
 
     std::size_t needColumn(const std::string& name) const
     {
-        const auto found = findColumn(itsRow, name);
+        const auto found = itsRow.find(name);
         if (!found) {
-            itsFile.fail("no column " + shown(name) + " in the header " + shown(itsFile.line()));
+            itsFile.fail("no column " + shown(name) + " in the header " + shown(itsFile.text()));
         }
         return *found;
     }
 
     void readRow()
     {
-        if (itsRow.size() != itsFields) {
-            itsFile.fail(std::to_string(itsRow.size()) + " fields, expected the " + std::to_string(itsFields) +
+        if (itsRow.fields().size() != itsFields) {
+            itsFile.fail(std::to_string(itsRow.fields().size()) + " fields, expected the " + std::to_string(itsFields) +
                          " of the header");
         }
         if (!itsSignal) {
             for (const SignalColumn& each : itsColumns) {
-                take(each.name, each.signal, itsRow[each.column]);
+                take(each.name, each.signal, itsRow.fields()[each.column]);
             }
             return;
         }
-        const std::string_view name = itsRow[*itsSignal];
+        const std::string_view name = itsRow.fields()[*itsSignal];
         const auto signal = signalOf(name);
         if (!signal) {
             itsFile.fail("signal " + shown(name) + " is not known; a map tells which it is, or that it does not count");
         }
         if (*signal != NameMap::leftOut) {
-            take(name, *signal, itsRow[itsValue]);
+            take(name, *signal, itsRow.fields()[itsValue]);
         }
     }
 
     /// A row of unknown values may be one of before the simulation counts.
     bool namesItsPlace() const
     {
-        return !isUnknown(itsRow[itsPass], NumberForm::integer) && !isUnknown(itsRow[itsStep], NumberForm::integer);
+        return !isUnknown(itsRow.fields()[itsPass], NumberForm::integer) &&
+               !isUnknown(itsRow.fields()[itsStep], NumberForm::integer);
     }
 
     void take(std::string_view name, unsigned signal, std::string_view text)
@@ -155,23 +147,23 @@ private:
             return;
         }
         const Place place = {
-            itsFile.count("half-iteration", itsRow[itsPass], itsMap.firstPass, itsDump.values.passes()),
+            itsFile.count("half-iteration", itsRow.fields()[itsPass], itsMap.firstPass, itsDump.values.passes()),
             signal,
-            itsFile.count("step", itsRow[itsStep], itsMap.firstStep, itsDump.values.steps())};
+            itsFile.count("step", itsRow.fields()[itsStep], itsMap.firstStep, itsDump.values.steps())};
         const std::int16_t value = unknown ? Values::unknown : itsFile.value(name, signal, text, itsMap);
         if (itsDump.values.at(place) != Values::missing) {
             itsFile.fail(std::string(name) + " of this half-iteration and step stands in line " +
                          std::to_string(itsDump.lineOf(place)) + ", too");
         }
         itsDump.values.set(place, value);
-        itsDump.lineOf(place) = itsFile.number();
+        itsDump.lineOf(place) = static_cast<std::uint32_t>(itsFile.number());
     }
 
     DumpFile itsFile;
+    base::CsvReader itsRow{itsFile};
     const NameMap& itsMap;
     Dump& itsDump;
     std::set<std::string, std::less<>> itsLacking;  // of the names that the map needs
-    Fields itsRow;                                  // of the line
     std::size_t itsPass = 0;
     std::size_t itsStep = 0;
     std::size_t itsFields = 0;

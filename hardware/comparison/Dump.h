@@ -51,17 +51,17 @@ struct Dump {
 
 /// Reads CSV: a header with the columns half_iteration, step, signal and value in any order, or, for the last two, a
 /// column for each signal; the map may call them otherwise, and other columns are left alone. A value with digits of x,
-/// z, u or w is unknown; an empty one is none. What is wrong is thrown as a simulation::Error that opens with the
+/// z, u or w is unknown; an empty one is none. What is wrong is thrown as a base::Error that opens with the
 /// place.
 void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
 /// Reads a value change dump. In each scope with signals, half_iteration and step (in the scope or one around it) tell
 /// what the signals' values belong to, at the end of each time at which the scope has changed. A value is unknown where
 /// it is so at all times at which half_iteration and step name it: x before, between and behind these times means
-/// nothing. What is wrong is thrown as a simulation::Error that opens with the place.
+/// nothing. What is wrong is thrown as a base::Error that opens with the place.
 void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
-/// Has a branch metric of the dump stand for its twin, when the dump lacks that. Throws a simulation::Error when the
+/// Has a branch metric of the dump stand for its twin, when the dump lacks that. Throws a base::Error when the
 /// map says that it does, and the dump has both.
 void completeTwins(const std::string& name, const NameMap& map, Dump& dump);
 

@@ -9,13 +9,14 @@
 #include <string_view>
 
 #include "NameMap.h"
-#include "hardware/testbench/LineFile.h"
+#include "base/LineReader.h"
 
 namespace morvik::comparison {
 
-class DumpFile : public LineFile {
+class DumpFile : public base::LineReader {
 public:
-    using LineFile::LineFile;
+    /// `input` outlives the file; `name` is what messages call it.
+    DumpFile(std::istream& input, const std::string& name);
 
     /// What is wrong with the dump as a whole.
     [[noreturn]] void failAsAWhole(const std::string& what) const;

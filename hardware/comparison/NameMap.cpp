@@ -3,16 +3,15 @@
 
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <cmath>
-#include <system_error>
 #include <utility>
 
 #include "Values.h"
+#include "base/Error.h"
 #include "base/Json.h"
+#include "base/Numbers.h"
 #include "base/Shown.h"
-#include "simulation/Error.h"
-#include "simulation/TextFile.h"
+#include "base/TextFile.h"
 
 namespace morvik::comparison {
 
@@ -31,22 +30,11 @@ constexpr std::array<std::pair<const char*, NumberForm>, 6> numberForms = {{{"au
 
 constexpr char signalNames[] = "intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic";
 
-std::optional<std::int64_t> integer(std::string_view text, int base)
-{
-    std::int64_t value = 0;
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value, base);
-    return result.ec == std::errc() && result.ptr == end ? std::optional<std::int64_t>(value) : std::nullopt;
-}
-
 /// A real number that is a multiple of an eighth.
 std::optional<std::int64_t> eighths(std::string_view text)
 {
-    double value = 0;
-    const char* const end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    const double scaled = 8 * value;
-    if (result.ec != std::errc() || result.ptr != end || !(std::abs(scaled) < 1e9) || scaled != std::floor(scaled)) {
+    const double scaled = 8 * base::parseNumber<double>(text).value_or(NAN);
+    if (!(std::abs(scaled) < 1e9) || scaled != std::floor(scaled)) {
         return std::nullopt;
     }
     return static_cast<std::int64_t>(scaled);
@@ -78,7 +66,7 @@ public:
 private:
     [[noreturn]] void fail(const std::string& what) const
     {
-        throw simulation::Error(itsName + ": " + what);
+        throw base::Error(itsName + ": " + what);
     }
 
     void readMember(const std::string& key, const Json& value, NameMap& map) const
@@ -239,26 +227,26 @@ std::optional<std::int64_t> NameMap::number(std::string_view text, unsigned sign
     const unsigned width = bits[signal];
     const bool isHexadecimal = text.substr(0, 2) == "0x" || text.substr(0, 2) == "0X";
     if (text.size() > 1 && text[0] == '+' && text[1] != '-') {
-        text.remove_prefix(1);  // which from_chars() does not take
+        text.remove_prefix(1);  // which parseNumber() does not take
     }
     switch (numbers) {
     case NumberForm::integer:
-        return integer(text, 10);
+        return base::parseNumber<std::int64_t>(text, 10);
     case NumberForm::unsignedInteger:
-        return complement(integer(text, 10), width);
+        return complement(base::parseNumber<std::int64_t>(text, 10), width);
     case NumberForm::real:
         return eighths(text);
     case NumberForm::hexadecimal:
-        return complement(integer(isHexadecimal ? text.substr(2) : text, 16), width);
+        return complement(base::parseNumber<std::int64_t>(isHexadecimal ? text.substr(2) : text, 16), width);
     case NumberForm::binary:
-        return complement(integer(text, 2), width);
+        return complement(base::parseNumber<std::int64_t>(text, 2), width);
     default:
         break;
     }
     if (isHexadecimal) {
-        return complement(integer(text.substr(2), 16), width);
+        return complement(base::parseNumber<std::int64_t>(text.substr(2), 16), width);
     }
-    return text.find('.') == std::string_view::npos ? integer(text, 10) : eighths(text);
+    return text.find('.') == std::string_view::npos ? base::parseNumber<std::int64_t>(text, 10) : eighths(text);
 }
 
 std::string NameMap::expectedNumber(unsigned signal) const
@@ -284,9 +272,9 @@ std::string NameMap::expectedNumber(unsigned signal) const
 NameMap readNameMap(std::istream& input, const std::string& name)
 {
     constexpr std::size_t largest = std::size_t{1} << 20;  // more than a map needs for every net of a core
-    const Json object = base::parseJson(simulation::readText(input, name, largest), name);
+    const Json object = base::parseJson(base::readText(input, name, largest), name);
     if (!object.is_object()) {
-        throw simulation::Error(name + ": no map, expected a JSON object");
+        throw base::Error(name + ": no map, expected a JSON object");
     }
     return MapReader(object, name).read();
 }

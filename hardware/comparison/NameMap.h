@@ -66,7 +66,7 @@ struct NameMap {
     std::string expectedNumber(unsigned signal) const;
 };
 
-/// Throws a simulation::Error that opens with the file.
+/// Throws a base::Error that opens with the file.
 NameMap readNameMap(std::istream& input, const std::string& name);
 
 }  // namespace morvik::comparison

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "Patterns.h"
+#include "base/Text.h"
 
 namespace morvik::comparison {
 
@@ -28,11 +29,6 @@ __attribute__((format(printf, 1, 2))) std::string format(const char* form, ...)
     va_end(again);
     text.pop_back();
     return text;
-}
-
-std::string counted(std::uint64_t count, const std::string& noun)
-{
-    return std::to_string(count) + ' ' + noun + (count == 1 ? "" : "s");
 }
 
 const char* codeName(unsigned pass)
@@ -111,8 +107,9 @@ private:
         const Comparison& all = itsComparison;
         itsText =
             itsCompared.name + format(": compared %u of %u half-iterations, ", all.passes, itsDump.values.passes());
-        itsText += std::to_string(all.compared()) + " of " + counted(itsCompared.coverage.computed, "value") + ": ";
-        itsText += all.first ? counted(all.different(), "difference") : "all as the model computes them";
+        itsText +=
+            std::to_string(all.compared()) + " of " + base::counted(itsCompared.coverage.computed, "value") + ": ";
+        itsText += all.first ? base::counted(all.different(), "difference") : "all as the model computes them";
         if (all.unknown() > 0 && !all.ignoresUnknown) {
             itsText += all.knownDifferent() == 0 ? ", all of them" : ", " + std::to_string(all.unknown()) + " of them";
             itsText += " unknown values (x)";
@@ -124,7 +121,7 @@ private:
     {
         const Coverage& coverage = itsCompared.coverage;
         if (itsComparison.ignoresUnknown && itsComparison.unknown() > 0) {
-            itsText += "  ignored: " + counted(itsComparison.unknown(), "unknown value") + " (x)\n";
+            itsText += "  ignored: " + base::counted(itsComparison.unknown(), "unknown value") + " (x)\n";
         }
         for (const std::string& each : itsDump.waveform ? itsDump.waveform->notes : std::vector<std::string>()) {
             itsText += "  by the map: " + each + '\n';
@@ -349,9 +346,9 @@ private:
             const std::uint64_t faults = sum<&SignalCount::unknownFaults>(stage);
             const std::uint64_t unknown = itsComparison.ignoresUnknown ? 0 : sum<&SignalCount::unknown>(stage);
             if (faults > 0) {
-                add(stage, counted(faults, "fault"), "unknown (x), though all inputs are known.\n");
+                add(stage, base::counted(faults, "fault"), "unknown (x), though all inputs are known.\n");
             } else if (!itsComparison.inputsAreKnown && stage == first && unknown > 0) {
-                add(stage, counted(unknown, "difference"), "unknown (x).\n");
+                add(stage, base::counted(unknown, "difference"), "unknown (x).\n");
             }
         }
     }
@@ -375,7 +372,7 @@ private:
     void addFinding(const Finding& finding)
     {
         itsText += std::string("Found in ") + wordsOf(finding.stage).values + ", " +
-                   counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
+                   base::counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
         itsText += (finding.where.empty() ? "" : ", " + finding.where) + ":\n  ";
         const std::string part = format("%.0f %% of them", std::floor(100 * finding.explained));
         if (!finding.how.empty()) {

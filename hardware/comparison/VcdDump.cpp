@@ -1,7 +1,6 @@
 // VcdDump: dumps as value change dumps (IEEE 1364, clause 18).
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <cstddef>
 #include <cstdint>
 #include <iterator>
@@ -15,14 +14,15 @@
 #include "Dump.h"
 #include "DumpFile.h"
 #include "VcdScopes.h"
-#include "simulation/Error.h"
-#include "simulation/Shown.h"
+#include "base/Error.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
 
 namespace morvik::comparison {
 
 namespace {
 
-using simulation::shown;
+using base::shown;
 
 /// A digit of a vector: 0, 1, or unknown. VHDL has nine states (IEEE 1076, package std_logic_1164), L and H weak 0
 /// and 1.
@@ -95,7 +95,7 @@ private:
             if (!itsFile.nextFilled()) {
                 return false;
             }
-            itsRest = itsFile.line();
+            itsRest = itsFile.text();
         }
     }
 
@@ -128,7 +128,7 @@ private:
     auto placed(Action action)
     try {
         return action();
-    } catch (const simulation::Error& error) {
+    } catch (const base::Error& error) {
         itsFile.fail(error.what());
     }
 
@@ -166,27 +166,23 @@ private:
     void readTimescale(const std::string& text)
     {
         const std::size_t digits = std::min(text.find_first_not_of("0123456789"), text.size());
-        std::uint64_t factor = 0;
-        const auto result = std::from_chars(text.data(), text.data() + digits, factor);
+        const auto factor = base::parseNumber<std::uint64_t>(std::string_view(text).substr(0, digits));
         const std::string unit = text.substr(digits);
         constexpr std::array<std::string_view, 6> units = {"s", "ms", "us", "ns", "ps", "fs"};
-        if (result.ec != std::errc() || factor == 0 || std::find(units.begin(), units.end(), unit) == units.end()) {
+        if (factor.value_or(0) == 0 || std::find(units.begin(), units.end(), unit) == units.end()) {
             itsFile.fail("timescale " + shown(text) +
                          " is not allowed, expected 1, 10 or 100 and s, ms, us, ns, ps or fs");
         }
-        itsTimescale = {factor, unit};
+        itsTimescale = {*factor, unit};
     }
 
     void readTime()
     {
-        const std::string_view digits = itsWord.substr(1);
-        const char* const end = digits.data() + digits.size();
-        const auto result = std::from_chars(digits.data(), end, itsTime);
-        if (result.ec != std::errc() || result.ptr != end ||
-            itsTime > std::numeric_limits<std::uint64_t>::max() / itsTimescale.factor) {
+        const auto time = base::parseNumber<std::uint64_t>(itsWord.substr(1));
+        if (!time || *time > std::numeric_limits<std::uint64_t>::max() / itsTimescale.factor) {
             itsFile.fail(shown(itsWord) + " is no time");
         }
-        itsTime *= itsTimescale.factor;
+        itsTime = *time * itsTimescale.factor;
     }
 
     void readVariable()
@@ -294,7 +290,7 @@ private:
     {
         VcdVariable& variable = itsScopes.variables()[number];
         variable.value = isReal ? realValue(variable, digits) : bitsValue(variable, digits);
-        variable.line = itsFile.number();
+        variable.line = static_cast<std::uint32_t>(itsFile.number());
         for (const unsigned scope : itsDependents[number]) {
             if (!itsHasChanged[scope]) {
                 itsHasChanged[scope] = true;
@@ -387,7 +383,7 @@ private:
             failAboutOwner(itsScopes.variables()[owner], variable, place);
         }
         itsDump.values.set(place, variable.value ? static_cast<std::int16_t>(*variable.value) : Values::unknown);
-        itsDump.lineOf(place) = variable.value ? variable.line : itsFile.number();
+        itsDump.lineOf(place) = variable.value ? variable.line : static_cast<std::uint32_t>(itsFile.number());
         owner = number;
         waveform.times[itsDump.values.index(place)] = itsTime;
         if (std::string& name = waveform.names[number]; name.empty()) {

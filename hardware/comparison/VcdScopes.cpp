@@ -7,9 +7,9 @@
 #include <tuple>
 
 #include "Values.h"
+#include "base/Error.h"
 #include "base/Printable.h"
-#include "simulation/Error.h"
-#include "simulation/Shown.h"
+#include "base/Shown.h"
 
 namespace morvik::comparison {
 
@@ -27,7 +27,7 @@ void VcdScopes::enter(const std::string& name)
     const auto [place, isNew] = itsScopeNumbers.try_emplace({itsScope, name}, number);
     if (isNew) {
         if (number == mostScopes) {
-            throw simulation::Error("more than " + std::to_string(mostScopes) + " scopes");
+            throw base::Error("more than " + std::to_string(mostScopes) + " scopes");
         }
         VcdScope scope;
         scope.name = name;
@@ -40,7 +40,7 @@ void VcdScopes::enter(const std::string& name)
 void VcdScopes::leave()
 {
     if (itsScope == nobody) {
-        throw simulation::Error("$upscope outside of all scopes");
+        throw base::Error("$upscope outside of all scopes");
     }
     itsScope = itsScopes[itsScope].parent;
 }
@@ -87,7 +87,7 @@ bool VcdScopes::isCalled(const VcdVariable& variable, const std::string& name) c
 void VcdScopes::setRole(unsigned& member, unsigned number) const
 {
     if (member != nobody && netOf(member) != netOf(number)) {
-        throw simulation::Error("two variables are " + simulation::shown(pathOf(itsVariables[number])));
+        throw base::Error("two variables are " + base::shown(pathOf(itsVariables[number])));
     }
     member = number;
 }
@@ -95,7 +95,7 @@ void VcdScopes::setRole(unsigned& member, unsigned number) const
 bool VcdScopes::declare(VcdVariable variable)
 {
     if (itsScope == nobody) {
-        throw simulation::Error("variable " + simulation::shown(variable.name) + " outside of all scopes");
+        throw base::Error("variable " + base::shown(variable.name) + " outside of all scopes");
     }
     variable.scope = itsScope;
     bool isSignal = false;
@@ -237,8 +237,8 @@ void VcdScopes::expectPlaces(const VcdVariable& variable) const
         const std::string& name = scope.pass == nobody   ? itsMap.passColumn
                                   : scope.step == nobody ? itsMap.stepColumn
                                                          : itsMap.valid;
-        throw simulation::Error("no variable " + simulation::shown(name) + " in the scope of \"" + pathOf(variable) +
-                                "\" or around it");
+        throw base::Error("no variable " + base::shown(name) + " in the scope of \"" + pathOf(variable) +
+                          "\" or around it");
     }
 }
 
@@ -261,8 +261,8 @@ std::string VcdScopes::pathOf(const VcdVariable& variable) const
 void failAboutTwo(const VcdScopes& scopes, const VcdVariable& one, const VcdVariable& other)
 {
     const std::string signal = passSignals[other.signal];
-    throw simulation::Error("two variables are " + signal + ", " + scopes.pathOf(one) + " and " + scopes.pathOf(other) +
-                            "; a map chooses: {\"signals\": {\"" + scopes.pathOf(other) + "\": \"" + signal + "\"}}");
+    throw base::Error("two variables are " + signal + ", " + scopes.pathOf(one) + " and " + scopes.pathOf(other) +
+                      "; a map chooses: {\"signals\": {\"" + scopes.pathOf(other) + "\": \"" + signal + "\"}}");
 }
 
 }  // namespace morvik::comparison

@@ -44,7 +44,7 @@ struct VcdScope {
 };
 
 /// Memory and time grow with the number of scopes and variables, and not with how deep they lie. What is wrong is
-/// thrown as a simulation::Error without a place.
+/// thrown as a base::Error without a place.
 class VcdScopes {
 public:
     /// More than a design has: a dump with more has no end.

@@ -10,8 +10,8 @@
 #include <vector>
 
 #include "TraceWriter.h"
+#include "base/Numbers.h"
 #include "hardware/testbench/Decoder.h"
-#include "hardware/vectors/Numbers.h"
 
 namespace morvik::trace {
 
@@ -20,8 +20,8 @@ namespace {
 /// The half-iteration whose table begins with the line, "decode=N siso=N".
 std::optional<std::int64_t> beginningPass(std::string_view line)
 {
-    if (vectors::take(line, "decode=") && vectors::takeInteger(line) && vectors::take(line, " siso=")) {
-        return vectors::takeInteger(line);
+    if (base::take(line, "decode=") && base::takeInteger(line) && base::take(line, " siso=")) {
+        return base::takeInteger(line);
     }
     return std::nullopt;
 }

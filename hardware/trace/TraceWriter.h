@@ -11,7 +11,7 @@
 
 namespace morvik::trace {
 
-/// What goes wrong is thrown as a simulation::Error that opens with the file. No writer keeps more than a pass.
+/// What goes wrong is thrown as a base::Error that opens with the file. No writer keeps more than a pass.
 class TraceWriter {
 public:
     virtual ~TraceWriter() = default;

@@ -4,9 +4,9 @@
 #include <algorithm>
 #include <array>
 
+#include "base/Error.h"
 #include "hardware/testbench/SoftBlock.h"
 #include "rules/BlockSizes.h"
-#include "simulation/Error.h"
 
 namespace morvik::vectors {
 
@@ -39,11 +39,11 @@ Table internalTable()
 void checkBlock(const Row& row, std::uint32_t iterations, const std::string& place)
 {
     if (standard::findBlockSize(static_cast<std::uint32_t>(row[0])) == nullptr) {
-        throw simulation::Error(place + ": block_size " + std::to_string(row[0]) + " is none of 3GPP TS 36.212");
+        throw base::Error(place + ": block_size " + std::to_string(row[0]) + " is none of 3GPP TS 36.212");
     }
     if (row[1] != iterations) {
-        throw simulation::Error(place + ": iterations " + std::to_string(row[1]) + ", the manifest says " +
-                                std::to_string(iterations));
+        throw base::Error(place + ": iterations " + std::to_string(row[1]) + ", the manifest says " +
+                          std::to_string(iterations));
     }
 }
 
@@ -202,8 +202,8 @@ bool BlockReader::nextRow(std::size_t table)
         return false;
     }
     if (reader.block().value_or(itsBlock) != itsBlock) {
-        throw simulation::Error(reader.place() + ": block " + std::to_string(*reader.block()) +
-                                ", expected a row of block " + std::to_string(itsBlock));
+        throw base::Error(reader.place() + ": block " + std::to_string(*reader.block()) + ", expected a row of block " +
+                          std::to_string(itsBlock));
     }
     ++itsRows[table];
     return true;
@@ -213,17 +213,16 @@ bool BlockReader::nextRow(std::size_t table)
 void BlockReader::expectFirst(std::size_t column, std::size_t table) const
 {
     if (static_cast<std::uint64_t>(itsRow[column]) != itsRows[table]) {
-        throw simulation::Error(itsReaders[itsLayout.blocks]->place() + ": " + blocksTable().columns[column].name +
-                                ' ' + std::to_string(itsRow[column]) + ", the block begins at " +
-                                std::to_string(itsRows[table]));
+        throw base::Error(itsReaders[itsLayout.blocks]->place() + ": " + blocksTable().columns[column].name + ' ' +
+                          std::to_string(itsRow[column]) + ", the block begins at " + std::to_string(itsRows[table]));
     }
 }
 
 void BlockReader::readRow(std::size_t table)
 {
     if (!nextRow(table)) {
-        throw simulation::Error(itsReaders[table]->place() + ": the rows of " + itsLayout.tables[table].name +
-                                " end too early for the blocks");
+        throw base::Error(itsReaders[table]->place() + ": the rows of " + itsLayout.tables[table].name +
+                          " end too early for the blocks");
     }
 }
 
@@ -272,8 +271,8 @@ void BlockReader::expectEnd()
 {
     for (std::size_t table = 1; table < itsReaders.size(); ++table) {
         if (itsReaders[table]->next(itsRow)) {
-            throw simulation::Error(itsReaders[table]->place() + ": has more rows of " + itsLayout.tables[table].name +
-                                    " than the blocks need");
+            throw base::Error(itsReaders[table]->place() + ": has more rows of " + itsLayout.tables[table].name +
+                              " than the blocks need");
         }
     }
 }

@@ -64,7 +64,7 @@ private:
     std::uint32_t itsBlock = 0;
 };
 
-/// Reads them again. What is wrong is thrown as a simulation::Error that opens with the place.
+/// Reads them again. What is wrong is thrown as a base::Error that opens with the place.
 class BlockReader {
 public:
     BlockReader(const std::string& folder, const Format& format, const Settings& settings);

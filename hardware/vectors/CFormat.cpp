@@ -4,15 +4,21 @@
 #include <utility>
 
 #include "Formats.h"
-#include "Numbers.h"
-#include "hardware/testbench/LineFile.h"
-#include "simulation/Shown.h"
+#include "base/InputFile.h"
+#include "base/LineReader.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
 
 namespace morvik::vectors {
 
 namespace {
 
 constexpr char end[] = "};";
+
+std::string fileOf(const std::string& folder, const Table& table)
+{
+    return folder + '/' + table.name + ".c";
+}
 
 std::string typeOf(const Table& table)
 {
@@ -59,7 +65,7 @@ std::string headerText(const Table& table, std::uint64_t rows)
 class CWriter : public TableWriter {
 public:
     CWriter(std::string folder, Table table)
-        : itsFolder(std::move(folder)), itsTable(std::move(table)), itsFile(itsFolder + '/' + itsTable.name + ".c")
+        : itsFolder(std::move(folder)), itsTable(std::move(table)), itsFile(fileOf(itsFolder, itsTable))
     {
         itsFile.write("#include \"" + itsTable.name + ".h\"\n\n" + beginning(itsTable) + '\n');
         itsSuffix = storageOf(itsTable).isSigned ? "" : "U";
@@ -98,26 +104,28 @@ private:
 class CReader : public TableReader {
 public:
     CReader(const std::string& folder, Table table)
-        : itsTable(std::move(table)), itsFile(folder + '/' + itsTable.name + ".c")
+        : itsTable(std::move(table)),
+          itsFile(base::openFile(fileOf(folder, itsTable))),
+          itsLines(itsFile, fileOf(folder, itsTable), base::LineReader::longLines)
     {
         do {
-            if (!itsFile.next()) {
-                itsFile.fail("no line \"" + beginning(itsTable) + '"');
+            if (!itsLines.next()) {
+                itsLines.fail("no line \"" + beginning(itsTable) + '"');
             }
-        } while (itsFile.line() != beginning(itsTable));
+        } while (itsLines.text() != beginning(itsTable));
     }
 
     bool next(Row& row) override
     {
-        if (!itsFile.next()) {
-            itsFile.fail(std::string("no line \"") + end + '"');
+        if (!itsLines.next()) {
+            itsLines.fail(std::string("no line \"") + end + '"');
         }
-        if (itsFile.line() == end) {
+        if (itsLines.text() == end) {
             return false;
         }
         if (!readRow(row)) {
-            itsFile.fail("row " + simulation::shown(itsFile.line()) + ", expected " +
-                         std::to_string(itsTable.columns.size()) + " decimal integers as they were written");
+            itsLines.fail("row " + base::shown(itsLines.text()) + ", expected " +
+                          std::to_string(itsTable.columns.size()) + " decimal integers as they were written");
         }
         checkFits(row, itsTable, *this);
         return true;
@@ -125,7 +133,7 @@ public:
 
     std::string place() const override
     {
-        return itsFile.place();
+        return itsLines.place();
     }
 
 private:
@@ -134,18 +142,19 @@ private:
         row.resize(itsTable.columns.size());
         const bool isArray = row.size() > 1;
         const char* const suffix = storageOf(itsTable).isSigned ? "" : "U";
-        std::string_view rest = itsFile.line();
-        bool isRow = take(rest, isArray ? "    {" : "    ");
+        std::string_view rest = itsLines.text();
+        bool isRow = base::take(rest, isArray ? "    {" : "    ");
         for (std::size_t i = 0; isRow && i < row.size(); ++i) {
-            const auto value = i == 0 || take(rest, ", ") ? takeInteger(rest) : std::nullopt;
-            isRow = value.has_value() && take(rest, suffix);
+            const auto value = i == 0 || base::take(rest, ", ") ? base::takeInteger(rest) : std::nullopt;
+            isRow = value.has_value() && base::take(rest, suffix);
             row[i] = value.value_or(0);
         }
-        return isRow && take(rest, isArray ? "}," : ",") && rest.empty();
+        return isRow && base::take(rest, isArray ? "}," : ",") && rest.empty();
     }
 
     Table itsTable;
-    LineFile itsFile;
+    std::ifstream itsFile;
+    base::LineReader itsLines;
 };
 
 }  // namespace

@@ -4,23 +4,23 @@
 #include <algorithm>
 #include <system_error>
 
-#include "report/ChildProcess.h"
-#include "simulation/Error.h"
-#include "simulation/TextFile.h"
+#include "base/ChildProcess.h"
+#include "base/Error.h"
+#include "base/TextFile.h"
 
 namespace morvik::vectors {
 
 std::string sha256(const std::string& fileName)
 {
-    simulation::expectRegularFile(fileName);
-    report::Outcome outcome{};
+    base::expectRegularFile(fileName);
+    base::Outcome outcome{};
     try {
-        outcome = report::runProgram({"sha256sum", "--", fileName}, "");
+        outcome = base::runProgram({"sha256sum", "--", fileName}, "");
     } catch (const std::system_error& error) {
-        throw simulation::Error(std::string("sha256sum cannot be started: ") + error.what());
+        throw base::Error(std::string("sha256sum cannot be started: ") + error.what());
     }
     if (!outcome.succeeded) {
-        throw simulation::Error(outcome.err.substr(0, outcome.err.find('\n')));
+        throw base::Error(outcome.err.substr(0, outcome.err.find('\n')));
     }
     constexpr std::size_t digits = 64;
     std::string& line = outcome.out;

@@ -6,7 +6,7 @@
 
 namespace morvik::vectors {
 
-/// 64 hexadecimal digits, as sha256sum of the GNU core utilities finds them. Throws simulation::Error,
+/// 64 hexadecimal digits, as sha256sum of the GNU core utilities finds them. Throws base::Error,
 /// also when it is no regular file.
 std::string sha256(const std::string& fileName);
 

@@ -2,10 +2,11 @@
 #include <utility>
 
 #include "Formats.h"
-#include "Numbers.h"
 #include "base/Csv.h"
-#include "hardware/testbench/LineFile.h"
-#include "simulation/Shown.h"
+#include "base/InputFile.h"
+#include "base/LineReader.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
 
 namespace morvik::vectors {
 
@@ -55,35 +56,32 @@ private:
 
 class CsvReader : public TableReader {
 public:
-    CsvReader(const std::string& folder, Table table) : itsTable(std::move(table)), itsFile(fileOf(folder, itsTable))
+    CsvReader(const std::string& folder, Table table)
+        : itsTable(std::move(table)),
+          itsFile(base::openFile(fileOf(folder, itsTable))),
+          itsLines(itsFile, fileOf(folder, itsTable), base::LineReader::longLines)
     {
-        if (!itsFile.next() || base::fieldsOf(itsFile.line()) != base::fieldsOf(header(itsTable))) {
-            itsFile.fail("expected \"" + header(itsTable) + '"');
+        if (!itsRow.next() || !itsRow.is(header(itsTable))) {
+            itsLines.fail("expected \"" + header(itsTable) + '"');
         }
     }
 
     bool next(Row& row) override
     {
-        if (!itsFile.next()) {
+        if (!itsRow.next()) {
             return false;
         }
-        std::string_view rest = itsFile.line();
-        takeBlanks(rest);
-        itsBlock = takeInteger(rest);
-        bool isRow = itsBlock.has_value();
         row.resize(itsTable.columns.size());
+        itsBlock = number(0);
+        bool isRow = itsRow.fields().size() == row.size() + 1 && itsBlock;
         for (std::size_t i = 0; isRow && i < row.size(); ++i) {
-            takeBlanks(rest);
-            const bool isNext = take(rest, ",");
-            takeBlanks(rest);
-            const auto value = isNext ? takeInteger(rest) : std::nullopt;
+            const auto value = number(i + 1);
             isRow = value.has_value();
             row[i] = value.value_or(0);
         }
-        takeBlanks(rest);
-        if (!isRow || !rest.empty()) {
-            itsFile.fail("row " + simulation::shown(itsFile.line()) + ", expected " + std::to_string(row.size() + 1) +
-                         " decimal integers with commas between them");
+        if (!isRow) {
+            itsLines.fail("row " + base::shown(itsLines.text()) + ", expected " + std::to_string(row.size() + 1) +
+                          " decimal integers with commas between them");
         }
         checkFits(row, itsTable, *this);
         return true;
@@ -96,12 +94,19 @@ public:
 
     std::string place() const override
     {
-        return itsFile.place();
+        return itsLines.place();
     }
 
 private:
+    std::optional<std::int64_t> number(std::size_t field) const
+    {
+        return base::parseNumber<std::int64_t>(itsRow.fields()[field]);
+    }
+
     Table itsTable;
-    LineFile itsFile;
+    std::ifstream itsFile;
+    base::LineReader itsLines;
+    base::CsvReader itsRow{itsLines};
     std::optional<std::int64_t> itsBlock;
 };
 

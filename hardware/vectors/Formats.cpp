@@ -1,7 +1,7 @@
 // Formats: how each of them writes and reads a table.
 #include "Formats.h"
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 
 namespace morvik::vectors {
 
@@ -42,9 +42,8 @@ void checkFits(std::int64_t value, const Column& column, const std::string& plac
     const std::int64_t range = std::int64_t{1} << column.bits;
     const std::int64_t lowest = column.isSigned ? -range / 2 : 0;
     if (value < lowest || value >= lowest + range) {
-        throw simulation::Error(place + ": " + column.name + ' ' + std::to_string(value) +
-                                " is not allowed, allowed are " + std::to_string(lowest) + " to " +
-                                std::to_string(lowest + range - 1));
+        throw base::Error(place + ": " + column.name + ' ' + std::to_string(value) + " is not allowed, allowed are " +
+                          std::to_string(lowest) + " to " + std::to_string(lowest + range - 1));
     }
 }
 

@@ -31,7 +31,7 @@ struct Storage {
 
 Storage storageOf(const Table& table);
 
-/// Throws a simulation::Error about the place unless the column holds such values.
+/// Throws a base::Error about the place unless the column holds such values.
 void checkFits(std::int64_t value, const Column& column, const std::string& place);
 
 /// So for each value of the row that the reader has come to.

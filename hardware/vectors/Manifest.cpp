@@ -4,13 +4,13 @@
 #include <algorithm>
 #include <cmath>
 
+#include "base/Error.h"
 #include "base/Json.h"
 #include "base/Shown.h"
+#include "base/TextFile.h"
+#include "base/Thousandths.h"
 #include "rules/BlockSizes.h"
-#include "simulation/Error.h"
 #include "simulation/Point.h"
-#include "simulation/TextFile.h"
-#include "simulation/Thousandths.h"
 
 namespace morvik::vectors {
 
@@ -27,7 +27,7 @@ Json parametersOf(const Settings& settings)
     json["iterations"] = settings.iterations;
     json["block_sizes"] = settings.blockSizes;
     json["blocks"] = settings.blocks;
-    json["ebn0_db"] = simulation::fromThousandths(settings.milliDecibels);
+    json["ebn0_db"] = base::fromThousandths(settings.milliDecibels);
     json["seed"] = settings.seed;
     json["directed"] = settings.directed;
     json["width"] = settings.width;
@@ -84,7 +84,7 @@ int milliDecibelsFrom(const base::JsonMembers& json)
     const double decibels = json.number("ebn0_db");
     const bool isInRange = decibels >= -most && decibels <= most;
     const int thousandths = isInRange ? static_cast<int>(std::lround(1000 * decibels)) : 0;
-    if (!isInRange || simulation::fromThousandths(thousandths) != decibels) {
+    if (!isInRange || base::fromThousandths(thousandths) != decibels) {
         json.refuse("ebn0_db", "allowed are -50 to 50 dB, with at most three decimals");
     }
     return thousandths;
@@ -128,11 +128,11 @@ std::vector<KeptTable> tablesFrom(const base::Json& list, const std::string& pla
             isThere ? base::JsonMembers(list[i], place + ": table").integer("rows", 0, UINT64_MAX) : 0;
         found.push_back({table, rows});
         if (!isThere || list[i] != base::Json(tableOf(found.back()))) {
-            throw simulation::Error(place + " lacks the table " + table.name + " as its parameters make it");
+            throw base::Error(place + " lacks the table " + table.name + " as its parameters make it");
         }
     }
     if (list.size() > found.size()) {
-        throw simulation::Error(place + " has more tables than its parameters make");
+        throw base::Error(place + " has more tables than its parameters make");
     }
     return found;
 }
@@ -145,7 +145,7 @@ ManifestFormat formatFrom(const base::Json& value, const Settings& settings, con
     found.name = json.text("name");
     const Format* const format = findFormat(found.name);
     if (format == nullptr) {
-        throw simulation::Error(fileName + ": format " + base::shown(found.name) + " is not known");
+        throw base::Error(fileName + ": format " + base::shown(found.name) + " is not known");
     }
     const std::string place = fileName + ": format " + found.name;
     for (const base::Json& each : json.list("files")) {
@@ -160,11 +160,11 @@ ManifestFormat formatFrom(const base::Json& value, const Settings& settings, con
     }
     for (std::size_t i = 0; i < names.size(); ++i) {
         if (i == found.files.size() || found.files[i].name != names[i]) {
-            throw simulation::Error(std::string(place).append(" lacks the file ").append(names[i]));
+            throw base::Error(std::string(place).append(" lacks the file ").append(names[i]));
         }
     }
     if (const std::size_t next = names.size(); next < found.files.size()) {
-        throw simulation::Error(place + " has no file " + base::shown(found.files[next].name));
+        throw base::Error(place + " has no file " + base::shown(found.files[next].name));
     }
     found.tables = tablesFrom(json.list("tables"), place, tables);
     return found;
@@ -204,7 +204,7 @@ Manifest parseManifest(const std::string& text, const std::string& fileName)
         if (std::any_of(manifest.formats.begin(), manifest.formats.end(), [&format](const ManifestFormat& other) {
                 return other.name == format.name;
             })) {
-            throw simulation::Error(fileName + ": names the format " + format.name + " twice");
+            throw base::Error(fileName + ": names the format " + format.name + " twice");
         }
         manifest.formats.push_back(format);
     }
@@ -214,18 +214,18 @@ Manifest parseManifest(const std::string& text, const std::string& fileName)
             {block.text("name"), word(block, "block_size"), word(block, "tag"), word(block, "expected_tag")});
     }
     if (manifest.formats.empty()) {
-        throw simulation::Error(fileName + ": names no format");
+        throw base::Error(fileName + ": names no format");
     }
     if (manifest.blocks.empty()) {
-        throw simulation::Error(fileName + ": names no block");
+        throw base::Error(fileName + ": names no block");
     }
     return manifest;
 }
 
 Manifest readManifest(const std::string& fileName)
 {
-    simulation::expectRegularFile(fileName);
-    return parseManifest(simulation::readText(fileName), fileName);
+    base::expectRegularFile(fileName);
+    return parseManifest(base::readText(fileName), fileName);
 }
 
 }  // namespace morvik::vectors

@@ -42,7 +42,7 @@ constexpr char manifestName[] = "manifest.json";
 
 std::string manifestText(const Manifest& manifest);
 
-/// Reads what a set is checked by. Throws a simulation::Error that opens with the file when the text is no such
+/// Reads what a set is checked by. Throws a base::Error that opens with the file when the text is no such
 /// manifest, has settings that cannot be, or names no block, no format, one twice, or other tables than the settings
 /// make.
 Manifest parseManifest(const std::string& text, const std::string& fileName);

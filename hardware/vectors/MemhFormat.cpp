@@ -1,11 +1,11 @@
 // MemhFormat: tables as words for $readmemh: a row is a word of hexadecimal digits, its first column in the lowest.
-#include <charconv>
-#include <system_error>
 #include <utility>
 
 #include "Formats.h"
-#include "hardware/testbench/LineFile.h"
-#include "simulation/Shown.h"
+#include "base/InputFile.h"
+#include "base/LineReader.h"
+#include "base/Numbers.h"
+#include "base/Shown.h"
 
 namespace morvik::vectors {
 
@@ -66,7 +66,10 @@ private:
 
 class MemhReader : public TableReader {
 public:
-    MemhReader(const std::string& folder, Table table) : itsTable(std::move(table)), itsFile(fileOf(folder, itsTable))
+    MemhReader(const std::string& folder, Table table)
+        : itsTable(std::move(table)),
+          itsFile(base::openFile(fileOf(folder, itsTable))),
+          itsLines(itsFile, fileOf(folder, itsTable), base::LineReader::longLines)
     {
         for (const Column& column : itsTable.columns) {
             itsDigits += digitsOf(column);
@@ -76,11 +79,11 @@ public:
     bool next(Row& row) override
     {
         do {
-            if (!itsFile.next()) {
+            if (!itsLines.next()) {
                 return false;
             }
-        } while (itsFile.line().empty() || itsFile.line().rfind("//", 0) == 0);
-        if (itsFile.line().size() != itsDigits) {
+        } while (itsLines.text().empty() || itsLines.text().rfind("//", 0) == 0);
+        if (itsLines.text().size() != itsDigits) {
             fail();
         }
         row.resize(itsTable.columns.size());
@@ -88,7 +91,7 @@ public:
         for (std::size_t i = 0; i < row.size(); ++i) {
             const Column& column = itsTable.columns[i];
             end -= digitsOf(column);
-            row[i] = value(std::string_view(itsFile.line()).substr(end, digitsOf(column)), column);
+            row[i] = value(itsLines.text().substr(end, digitsOf(column)), column);
         }
         checkFits(row, itsTable, *this);
         return true;
@@ -96,31 +99,30 @@ public:
 
     std::string place() const override
     {
-        return itsFile.place();
+        return itsLines.place();
     }
 
 private:
     [[noreturn]] void fail() const
     {
-        itsFile.fail("word " + simulation::shown(itsFile.line()) + ", expected " + std::to_string(itsDigits) +
-                     " hexadecimal digits");
+        itsLines.fail("word " + base::shown(itsLines.text()) + ", expected " + std::to_string(itsDigits) +
+                      " hexadecimal digits");
     }
 
     std::int64_t value(std::string_view digits, const Column& column) const
     {
-        std::uint64_t word = 0;
-        const char* const end = digits.data() + digits.size();
-        const auto result = std::from_chars(digits.data(), end, word, 16);
-        if (result.ec != std::errc() || result.ptr != end) {
+        const auto word = base::parseNumber<std::uint64_t>(digits, 16);
+        if (!word) {
             fail();
         }
         const std::int64_t range = std::int64_t{1} << bitsOfDigit * digits.size();
-        const auto unsignedValue = static_cast<std::int64_t>(word);
+        const auto unsignedValue = static_cast<std::int64_t>(*word);
         return column.isSigned && unsignedValue >= range / 2 ? unsignedValue - range : unsignedValue;
     }
 
     Table itsTable;
-    LineFile itsFile;
+    std::ifstream itsFile;
+    base::LineReader itsLines;
     std::size_t itsDigits = 0;
 };
 

@@ -4,8 +4,9 @@
 #include <utility>
 
 #include "Formats.h"
-#include "Numbers.h"
-#include "simulation/Error.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
+#include "base/Numbers.h"
 
 namespace morvik::vectors {
 
@@ -75,19 +76,16 @@ public:
         : itsTable(std::move(table)),
           itsStorage(storageOf(itsTable)),
           itsName(fileOf(folder, itsTable)),
-          itsFile(itsName, std::ios::binary),
+          itsFile(base::openFile(itsName)),
           itsPart(itsTable.columns.size() * itsStorage.bits / 8, '\0')
     {
-        if (!itsFile) {
-            throw simulation::fileError(itsName, "opened");
-        }
         std::string found(headerSize, '\0');
         itsFile.read(found.data(), headerSize);
         const std::size_t key = found.find(shapeKey);
         std::string_view rest = std::string_view(found).substr(key == std::string::npos ? headerSize : key);
-        const auto rows = take(rest, shapeKey) ? takeInteger(rest) : std::nullopt;
+        const auto rows = base::take(rest, shapeKey) ? base::takeInteger(rest) : std::nullopt;
         if (!rows || found != header(itsTable, static_cast<std::uint64_t>(*rows))) {
-            throw simulation::Error(itsName + ": is no array of NumPy as it was written");
+            throw base::Error(itsName + ": is no array of NumPy as it was written");
         }
         itsRows = static_cast<std::uint64_t>(*rows);
     }
@@ -96,12 +94,12 @@ public:
     {
         if (itsRow == itsRows) {
             if (itsFile.peek() != std::ifstream::traits_type::eof()) {
-                throw simulation::Error(itsName + ": has more numbers than its shape says");
+                throw base::Error(itsName + ": has more numbers than its shape says");
             }
             return false;
         }
         if (!itsFile.read(itsPart.data(), static_cast<std::streamsize>(itsPart.size()))) {
-            throw simulation::Error(itsName + ": ends before row " + std::to_string(itsRow));
+            throw base::Error(itsName + ": ends before row " + std::to_string(itsRow));
         }
         ++itsRow;
         row.resize(itsTable.columns.size());

@@ -9,8 +9,8 @@
 #include "Checksum.h"
 #include "Core.h"
 #include "SetFolder.h"
+#include "base/Error.h"
 #include "base/OutputFile.h"
-#include "simulation/Error.h"
 
 namespace morvik::vectors {
 
@@ -97,9 +97,9 @@ void expectRows(const std::string& folder, const ManifestFormat& format, const s
 {
     for (std::size_t i = 0; i < rows.size(); ++i) {
         if (format.tables[i].rows != rows[i]) {
-            throw simulation::Error(manifestIn(folder) + ": tells " + std::to_string(format.tables[i].rows) +
-                                    " rows of " + format.tables[i].table.name + " in " + format.name + ", there are " +
-                                    std::to_string(rows[i]));
+            throw base::Error(manifestIn(folder) + ": tells " + std::to_string(format.tables[i].rows) + " rows of " +
+                              format.tables[i].table.name + " in " + format.name + ", there are " +
+                              std::to_string(rows[i]));
         }
     }
 }
@@ -114,9 +114,8 @@ void expectSizes(const std::string& folder, const Manifest& manifest)
         }
         const unsigned size = manifest.settings.blockSizes[number / manifest.settings.blocks];
         if (block.K != size) {
-            throw simulation::Error(manifestIn(folder) + ": names random block " + std::to_string(number) + " of " +
-                                    std::to_string(block.K) + " bits, its parameters make it of " +
-                                    std::to_string(size));
+            throw base::Error(manifestIn(folder) + ": names random block " + std::to_string(number) + " of " +
+                              std::to_string(block.K) + " bits, its parameters make it of " + std::to_string(size));
         }
         ++number;
     }
@@ -132,13 +131,13 @@ void expectBlocks(const std::string& folder, const Manifest& manifest)
         }));
     const std::uint64_t expected = std::uint64_t{settings.blocks} * settings.blockSizes.size();
     if (random != expected) {
-        throw simulation::Error(manifestIn(folder) + ": names " + std::to_string(random) +
-                                " random blocks, its parameters make " + std::to_string(expected));
+        throw base::Error(manifestIn(folder) + ": names " + std::to_string(random) +
+                          " random blocks, its parameters make " + std::to_string(expected));
     }
     if (settings.directed != (random < manifest.blocks.size())) {
-        throw simulation::Error(manifestIn(folder) + ": names " +
-                                (settings.directed ? "no directed block" : "directed blocks") +
-                                ", its parameters make " + (settings.directed ? "some" : "none"));
+        throw base::Error(manifestIn(folder) + ": names " +
+                          (settings.directed ? "no directed block" : "directed blocks") + ", its parameters make " +
+                          (settings.directed ? "some" : "none"));
     }
     expectSizes(folder, manifest);
 }
@@ -154,8 +153,8 @@ void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
     }
     for (const std::string& name : others) {
         if (std::filesystem::exists(pathOf(folder, name))) {
-            throw simulation::Error(pathOf(folder, name) + ": is none of the files that " + manifestName +
-                                    " names, and cannot be checked");
+            throw base::Error(pathOf(folder, name) + ": is none of the files that " + manifestName +
+                              " names, and cannot be checked");
         }
     }
 }
@@ -169,7 +168,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
     for (const ManifestFile& file : format.files) {
         const std::string path = pathOf(folder, file.name);
         if (sha256(path) != file.sha256) {
-            throw simulation::Error(path + ": is not the file that was written, its sha256 differs from the manifest");
+            throw base::Error(path + ": is not the file that was written, its sha256 differs from the manifest");
         }
     }
     Core core(manifest.settings);
@@ -179,20 +178,20 @@ std::optional<std::string> checkFormat(const std::string& folder,
     std::size_t number = 0;
     for (; reader.next(stimulus, expected); ++number) {
         if (number == manifest.blocks.size()) {
-            throw simulation::Error(manifestIn(folder) + ": names fewer blocks than " + format.name + " has");
+            throw base::Error(manifestIn(folder) + ": names fewer blocks than " + format.name + " has");
         }
         if (const auto difference = differenceOf(core.expect(stimulus), expected)) {
             return format.name + ", block " + std::to_string(number) + " (" + manifest.blocks[number].name +
                    ", K = " + std::to_string(stimulus.K) + "): " + *difference;
         }
         if (!isNamed(stimulus, expected, manifest.blocks[number])) {
-            throw simulation::Error(manifestIn(folder) + ": has another size or tag of block " +
-                                    std::to_string(number) + " than " + format.name);
+            throw base::Error(manifestIn(folder) + ": has another size or tag of block " + std::to_string(number) +
+                              " than " + format.name);
         }
         count(compared, expected);
     }
     if (number < manifest.blocks.size()) {
-        throw simulation::Error(manifestIn(folder) + ": names more blocks than " + format.name + " has");
+        throw base::Error(manifestIn(folder) + ": names more blocks than " + format.name + " has");
     }
     expectRows(folder, format, reader.rows());
     return std::nullopt;

@@ -11,7 +11,7 @@
 namespace morvik::vectors {
 
 /// Makes a set in a folder that is not there, is empty, or holds an earlier set, which goes when the new one is
-/// complete. Other files stay. Throws simulation::Error. The manifest, whose settings, version and command are given,
+/// complete. Other files stay. Throws base::Error. The manifest, whose settings, version and command are given,
 /// is written last, and returned.
 Manifest makeSet(const std::string& folder, Manifest manifest);
 
@@ -30,7 +30,7 @@ struct CheckedSet {
     Compared compared;
 };
 
-/// Reads every format of a set and decodes its blocks again. Throws simulation::Error when a file is not as it was
+/// Reads every format of a set and decodes its blocks again. Throws base::Error when a file is not as it was
 /// written, and when the set has less or more than its manifest tells.
 CheckedSet checkSet(const std::string& folder);
 

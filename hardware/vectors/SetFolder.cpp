@@ -13,7 +13,7 @@
 #include "BlockFiles.h"
 #include "Manifest.h"
 #include "base/Descriptor.h"
-#include "simulation/Error.h"
+#include "base/Error.h"
 
 namespace morvik::vectors {
 
@@ -52,7 +52,7 @@ bool isFolder(const std::string& path)
 void expectOwnFolder(const std::string& path)
 {
     if (exists(path) && !isFolder(path)) {
-        throw simulation::Error(path + ": is no folder, and is left alone; remove it, or choose another folder");
+        throw base::Error(path + ": is no folder, and is left alone; remove it, or choose another folder");
     }
 }
 
@@ -66,7 +66,7 @@ std::string asideIn(const std::string& folder)
 void move(const std::string& from, const std::string& to)
 {
     if (std::rename(from.c_str(), to.c_str()) != 0) {
-        throw simulation::fileError(to, "written");
+        throw base::fileError(to, "written");
     }
 }
 
@@ -74,7 +74,7 @@ void move(const std::string& from, const std::string& to)
 void removeOne(const std::string& path)
 {
     if (std::remove(path.c_str()) != 0) {
-        throw simulation::fileError(path, "removed");
+        throw base::fileError(path, "removed");
     }
 }
 
@@ -88,7 +88,7 @@ std::vector<std::string> namesIn(const std::string& folder)
         entry.increment(problem);
     }
     if (problem) {
-        throw simulation::Error(folder + ": cannot be read: " + problem.message());
+        throw base::Error(folder + ": cannot be read: " + problem.message());
     }
     return names;
 }
@@ -113,8 +113,8 @@ void expectSetFiles(const std::string& folder, const std::set<std::string>& othe
     for (const std::string& name : namesIn(folder)) {
         const bool isKnown = known.count(name) != 0 || name.rfind(temporaryName, 0) == 0;
         if (others.count(name) == 0 && (!isKnown || isFolder(pathOf(folder, name)))) {
-            throw simulation::Error(pathOf(folder, name) + ": is no file of a set; " + folder +
-                                    " is for unfinished ones alone");
+            throw base::Error(pathOf(folder, name) + ": is no file of a set; " + folder +
+                              " is for unfinished ones alone");
         }
     }
 }
@@ -126,7 +126,7 @@ SetFolder::Made::Made(std::string folder) : path(std::move(folder)), isOwn(false
     std::error_code problem;
     isOwn = fs::create_directories(path, problem);
     if (problem || !fs::is_directory(path, problem)) {
-        throw simulation::Error(path + ": cannot be made" + (problem ? ": " + problem.message() : ""));
+        throw base::Error(path + ": cannot be made" + (problem ? ": " + problem.message() : ""));
     }
 }
 
@@ -142,9 +142,9 @@ SetFolder::SetFolder(std::string path)
     : itsFolder(std::move(path)), itsAside(asideIn(itsFolder.path)), itsLock(pathOf(itsAside.path, lockName))
 {
     if (itsLock.isTaken()) {
-        throw simulation::Error(itsFolder.path +
-                                ": another process is making a set in it; wait for that to end, or "
-                                "choose another folder");
+        throw base::Error(itsFolder.path +
+                          ": another process is making a set in it; wait for that to end, or "
+                          "choose another folder");
     }
     expectOwnAside();
     itsAside.isOwn = true;
@@ -158,7 +158,7 @@ SetFolder::~SetFolder()
         if (!exists(made(earlierName))) {
             clearAside();
         }
-    } catch (const simulation::Error&) {
+    } catch (const base::Error&) {
         return;  // the next one removes it
     }
 }
@@ -189,7 +189,7 @@ void SetFolder::place()
     const Made holder(made(earlierName));
     try {
         moveAll();
-    } catch (const simulation::Error&) {
+    } catch (const base::Error&) {
         moveBack();
         throw;
     }
@@ -277,7 +277,7 @@ void SetFolder::expectSetOrNothing() const
     if (exists(placed(manifestName))) {
         filesOf(placed(manifestName));
     } else if (namesIn(itsFolder.path).size() > 1) {
-        throw simulation::Error(itsFolder.path + ": is not empty and holds no " + manifestName + " of an earlier set");
+        throw base::Error(itsFolder.path + ": is not empty and holds no " + manifestName + " of an earlier set");
     }
 }
 
@@ -287,16 +287,16 @@ void SetFolder::expectMovable() const
     const std::vector<std::string> own = earlierFiles();
     for (const std::string& name : own) {
         if (isFolder(placed(name))) {
-            throw simulation::Error(placed(name) + ": is a folder, the earlier set has a file of this name");
+            throw base::Error(placed(name) + ": is a folder, the earlier set has a file of this name");
         }
     }
     for (const std::string& name : filesOf(made(manifestName))) {
         const bool isThere = exists(placed(name));
         if (!exists(made(name)) && !(isThere && exists(made(earlierName)))) {
-            throw simulation::Error(made(name) + ": is missing, the unfinished set cannot be placed");
+            throw base::Error(made(name) + ": is missing, the unfinished set cannot be placed");
         }
         if (exists(made(name)) && isThere && std::find(own.begin(), own.end(), name) == own.end()) {
-            throw simulation::Error(placed(name) + ": is no file of the earlier set, and the new one has such a file");
+            throw base::Error(placed(name) + ": is no file of the earlier set, and the new one has such a file");
         }
     }
 }
@@ -315,9 +315,9 @@ std::vector<std::string> SetFolder::earlierFiles() const
 void expectPlaced(const std::string& folder)
 {
     if (!exists(pathOf(folder, manifestName)) && exists(pathOf(folder, asideName) + '/' + manifestName)) {
-        throw simulation::Error(folder +
-                                ": has a set that is not placed yet; if its command was killed, the next "
-                                "'morvik vectors --out' into this folder finishes it");
+        throw base::Error(folder +
+                          ": has a set that is not placed yet; if its command was killed, the next "
+                          "'morvik vectors --out' into this folder finishes it");
     }
 }
 

@@ -5,11 +5,11 @@
 #include <string>
 #include <vector>
 
-#include "simulation/OwnFile.h"
+#include "base/OwnFile.h"
 
 namespace morvik::vectors {
 
-/// Files that are not of a set stay as they are. Everything throws simulation::Error.
+/// Files that are not of a set stay as they are. Everything throws base::Error.
 ///
 /// A new set is made aside, in a hidden folder within. When it is complete, the files of the earlier one go aside, too,
 /// and the new ones take their place. The manifest goes first and comes last: without it, there is no set. If a step
@@ -61,7 +61,7 @@ private:
 
     Made itsFolder;
     Made itsAside;
-    simulation::OwnFile itsLock;
+    base::OwnFile itsLock;
 };
 
 /// Throws where a killed process has left a set that is half placed.

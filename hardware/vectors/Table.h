@@ -24,7 +24,7 @@ struct Table {
 
 using Row = std::vector<std::int64_t>;
 
-/// Writes the rows of a table to a file. What goes wrong is thrown as a simulation::Error that opens with the file.
+/// Writes the rows of a table to a file. What goes wrong is thrown as a base::Error that opens with the file.
 class TableWriter {
 public:
     virtual ~TableWriter() = default;
@@ -36,7 +36,7 @@ public:
     virtual void finish() = 0;
 };
 
-/// Reads the rows of a table. What is wrong is thrown as a simulation::Error that opens with the place.
+/// Reads the rows of a table. What is wrong is thrown as a base::Error that opens with the place.
 class TableReader {
 public:
     virtual ~TableReader() = default;

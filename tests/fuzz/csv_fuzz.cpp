@@ -1,10 +1,10 @@
 // csv_fuzz: the command's readers of soft values and reference bits take any text.
 #include <sstream>
 
-#include "Files.h"
 #include "FuzzInput.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "base/Error.h"
 
 namespace {
 
@@ -19,7 +19,7 @@ void readBlocks(const std::string& text)
             require(block.rsc1Par.size() == block.size() && block.rsc2Par.size() == block.size(),
                     "the three streams are of one length");
         }
-    } catch (const morvik::FileError& error) {
+    } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in:");
     }
 }
@@ -33,7 +33,7 @@ void readBits(const std::string& text)
             require(reference.countErrors({0, 1, 0, 1}) <= 4, "no more bits differ than there are");
         }
         reference.expectEnd();
-    } catch (const morvik::FileError& error) {
+    } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in:");
     }
 }

@@ -2,8 +2,8 @@
 #include <sstream>
 
 #include "FuzzInput.h"
+#include "base/Error.h"
 #include "hardware/comparison/Dump.h"
-#include "simulation/Error.h"
 
 namespace {
 
@@ -48,7 +48,7 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
         const NameMap names = mapOf(map);
         (isVcd ? morvik::comparison::readVcd : morvik::comparison::readCsv)(text, "in", names, dump);
         completeTwins("in", names, dump);
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in");
     }
     requireRange(dump);

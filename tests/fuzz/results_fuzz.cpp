@@ -1,7 +1,7 @@
 // results_fuzz: the readers of result files and checkpoints take any text.
 #include "FuzzInput.h"
+#include "base/Error.h"
 #include "simulation/Checkpoint.h"
-#include "simulation/Error.h"
 #include "simulation/Merge.h"
 #include "simulation/ResultFiles.h"
 
@@ -17,7 +17,7 @@ void readResults(const std::string& text, const std::string& name)
         const std::string json = jsonText(results);
         require(jsonText(parseResults(json, "in.json")) == json, "what was read is written, and read again as JSON");
         require(merge({{"in.csv", results}}).rows.size() <= results.rows.size(), "merging adds no rows");
-    } catch (const Error& error) {
+    } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in.");
     }
 }
@@ -34,7 +34,7 @@ void readCheckpoint(const std::string& text)
             const std::string written = checkpoint ? checkpointText(*checkpoint) : "";
             require(!checkpoint || checkpointText(parseCheckpoint(written, "in.checkpoint").value()) == written,
                     "what was read is written, and read again");
-        } catch (const Error& error) {
+        } catch (const morvik::base::Error& error) {
             requireOneLine(error, "in.checkpoint");
         }
     }

@@ -3,9 +3,9 @@
 
 #include "FuzzInput.h"
 #include "TemporaryFiles.h"
+#include "base/Error.h"
 #include "hardware/vectors/BlockFiles.h"
 #include "hardware/vectors/Manifest.h"
-#include "simulation/Error.h"
 
 namespace {
 
@@ -22,7 +22,7 @@ void readManifestText(const std::string& text)
                 require(file.name == std::filesystem::path(file.name).filename(), "a file lies in the folder");
             }
         }
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in");
     }
 }
@@ -56,7 +56,7 @@ void readBlocks(FuzzInput& input)
             require(stimulus.streams[2].size() == stimulus.K + 4, "a block has K + 4 positions");
             require(expected.bits.size() == stimulus.K, "a block has K decisions");
         }
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         requireOneLine(error, files.folder() + '/');
     }
 }

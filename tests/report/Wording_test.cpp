@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include "base/Numbers.h"
 #include "support/CommaLocale.h"
 
 namespace {
@@ -81,7 +82,7 @@ TEST(Wording, LocalesHaveNoSay)
     const CommaLocale locale;
     EXPECT_EQ(decibels(1234.5), "1234.50");
     EXPECT_EQ(rate(0.0123), "1.23e-02");
-    EXPECT_EQ(exact(1234.5), "1234.5");
+    EXPECT_EQ(morvik::base::numberText(1234.5), "1234.5");
     EXPECT_EQ(grouped(1234), "1\u202f234");
 }
 

@@ -9,7 +9,7 @@
 #include <sstream>
 #include <string>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "support/SyntheticFrames.h"
 
 namespace {
@@ -100,7 +100,7 @@ std::string refusal(const std::string& body)
 {
     try {
         return parsed(signedText(body)) ? "none" : "damaged";
-    } catch (const Error& error) {
+    } catch (const morvik::base::Error& error) {
         return error.what();
     }
 }

@@ -7,8 +7,8 @@
 #include <sstream>
 #include <stdexcept>
 
+#include "base/Thousandths.h"
 #include "simulation/Replay.h"
-#include "simulation/Thousandths.h"
 #include "simulation/ThreadWorkers.h"
 #include "support/Blocks.h"
 
@@ -21,7 +21,7 @@ BatchResult oneByOne(const Plan& plan, const FrameBatch& batch)
 {
     const Point& point = plan.points[batch.point];
     morvik::link::FrameSource source(
-        point.blockSize, point.milliDecibels, fromThousandths(point.milliScale), plan.seed);
+        point.blockSize, point.milliDecibels, morvik::base::fromThousandths(point.milliScale), plan.seed);
     morvik::link::Frames frames;
     BatchResult result;
     result.batch = batch;
@@ -195,7 +195,7 @@ TEST(Replay, WritesWhatWasSentAndReceived)
 
     const Point& point = plan.points[2];
     morvik::link::FrameSource source(
-        point.blockSize, point.milliDecibels, fromThousandths(point.milliScale), plan.seed);
+        point.blockSize, point.milliDecibels, morvik::base::fromThousandths(point.milliScale), plan.seed);
     morvik::link::Frames frames;
     source.make(frame, 1, frames);
     std::ostringstream soft;

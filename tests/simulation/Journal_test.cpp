@@ -3,7 +3,7 @@
 
 #include <gtest/gtest.h>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "simulation/ResultFiles.h"
 #include "support/SyntheticFrames.h"
 #include "support/TemporaryFolder.h"
@@ -42,7 +42,7 @@ protected:
     {
         try {
             const Journal journal(plan, output, earlier);
-        } catch (const Error& error) {
+        } catch (const morvik::base::Error& error) {
             return error.what();
         }
         return "none";
@@ -231,8 +231,8 @@ TEST_F(JournalFiles, ThatAreDamagedAreRefused)
 
 TEST_F(JournalFiles, ThatCannotBeWrittenAreRefusedAtOnce)
 {
-    EXPECT_THROW(Journal(plan, folder.path("none/results.csv"), Earlier::refuse), Error);
-    EXPECT_THROW(Journal(plan, folder.path("results.txt"), Earlier::refuse), Error);
+    EXPECT_THROW(Journal(plan, folder.path("none/results.csv"), Earlier::refuse), morvik::base::Error);
+    EXPECT_THROW(Journal(plan, folder.path("results.txt"), Earlier::refuse), morvik::base::Error);
     EXPECT_EQ(folder.names(), Names{});
 }
 
@@ -297,7 +297,7 @@ TEST_F(JournalFiles, OfOtherResultsTellWhatIsOtherIfTheyKnow)
     try {
         const Journal journal(plan, json, Earlier::resume);
         ADD_FAILURE() << "not refused";
-    } catch (const Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(),
                   json +
                       ": holds other results (--seed 1 instead of 2), and there is no checkpoint to resume; "

@@ -5,7 +5,7 @@
 
 #include <algorithm>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "simulation/ResultFiles.h"
 #include "support/ExampleResults.h"
 
@@ -23,7 +23,7 @@ std::string refusal(const std::vector<Part>& parts)
 {
     try {
         merge(parts);
-    } catch (const Error& error) {
+    } catch (const morvik::base::Error& error) {
         return error.what();
     }
     return "none";

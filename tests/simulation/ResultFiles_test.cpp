@@ -7,7 +7,7 @@
 #include <filesystem>
 #include <nlohmann/json.hpp>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "support/ExampleResults.h"
 #include "support/TemporaryFolder.h"
 
@@ -38,7 +38,7 @@ protected:
         folder.write(name, text);
         try {
             readResults(folder.path(name));
-        } catch (const Error& error) {
+        } catch (const morvik::base::Error& error) {
             const std::string message = error.what();
             const std::string place = folder.path("");
             EXPECT_EQ(message.substr(0, place.size()), place);
@@ -102,7 +102,7 @@ TEST_F(ResultFiles, AreReadAsTheyWereWritten)
 TEST_F(ResultFiles, AreRefusedByOtherNames)
 {
     for (const char* name : {"a.txt", "a", "csv", ".csv", "a.csv.gz", "-"}) {
-        EXPECT_THROW(formatOf(name), Error) << name;
+        EXPECT_THROW(formatOf(name), morvik::base::Error) << name;
     }
     EXPECT_EQ(formatOf("folder.json/a.csv"), ResultFormat::csv);
     EXPECT_EQ(formatOf("a.b.json"), ResultFormat::json);
@@ -110,8 +110,8 @@ TEST_F(ResultFiles, AreRefusedByOtherNames)
 
 TEST_F(ResultFiles, ThatAreNotThereAreRefused)
 {
-    EXPECT_THROW(readResults(folder.path("none.csv")), Error);
-    EXPECT_THROW(readResults(folder.path("none.json")), Error);
+    EXPECT_THROW(readResults(folder.path("none.csv")), morvik::base::Error);
+    EXPECT_THROW(readResults(folder.path("none.json")), morvik::base::Error);
 }
 
 TEST_F(ResultFiles, WithMistakesAreRefusedWithTheirPlaces)
@@ -206,7 +206,7 @@ TEST_F(ResultFiles, ThatAreNoTextAreRefused)
     try {
         readResults(folder.path("endless.csv"));
         FAIL() << "accepted";
-    } catch (const Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), folder.path("endless.csv") + ": is no text, it has a null character");
     }
 }

@@ -5,7 +5,7 @@
 
 #include <functional>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "support/SyntheticFrames.h"
 
 namespace {
@@ -42,7 +42,7 @@ protected:
         change(checkpoint);
         try {
             standingOf(plan, checkpoint, "a");
-        } catch (const Error& error) {
+        } catch (const morvik::base::Error& error) {
             return error.what();
         }
         return "none";

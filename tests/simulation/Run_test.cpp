@@ -8,7 +8,7 @@
 #include <random>
 #include <stdexcept>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "simulation/ResultFiles.h"
 #include "support/SyntheticFrames.h"
 #include "support/TemporaryFolder.h"

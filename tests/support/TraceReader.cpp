@@ -6,8 +6,8 @@
 #include <system_error>
 #include <utility>
 
-#include "simulation/Error.h"
-#include "simulation/Shown.h"
+#include "base/Error.h"
+#include "base/Shown.h"
 
 namespace morvik::support {
 
@@ -88,14 +88,14 @@ bool TraceReader::next(TraceStep& step)
         }
     }
     if (itsInput.bad()) {
-        throw simulation::fileError(itsName, "read");
+        throw base::fileError(itsName, "read");
     }
     return false;
 }
 
 void TraceReader::fail(const std::string& what) const
 {
-    throw simulation::Error(itsName + ':' + std::to_string(itsNumber) + ": " + what);
+    throw base::Error(itsName + ':' + std::to_string(itsNumber) + ": " + what);
 }
 
 void TraceReader::beginPass()
@@ -116,13 +116,13 @@ void TraceReader::readRow(TraceStep& step) const
     std::string_view rest = itsLine;
     const std::string_view number = takeField(rest);
     if (integer<std::uint32_t>(number) != step.step) {
-        fail("trellis step " + simulation::shown(number) + ", expected " + std::to_string(step.step));
+        fail("trellis step " + base::shown(number) + ", expected " + std::to_string(step.step));
     }
     for (std::size_t i = 0; i < traceSignals.size(); ++i) {
         const std::string_view field = takeField(rest);
         const auto value = traceValue(field);
         if (!value) {
-            fail(std::string(traceSignals[i]) + ' ' + simulation::shown(field) +
+            fail(std::string(traceSignals[i]) + ' ' + base::shown(field) +
                  " is no traced value, expected a sign and six decimals, a multiple of 1/8 from -256 to 255.875");
         }
         step.values[i] = *value;

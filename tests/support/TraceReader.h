@@ -32,7 +32,7 @@ struct TraceStep {
 /// Reads one trellis step at a time, so that memory does not grow with the trace.
 ///
 /// Input streams, headings and warnings between the rows are skipped. What cannot be read as a trace is thrown as a
-/// simulation::Error, which opens with the place, NAME:LINE.
+/// base::Error, which opens with the place, NAME:LINE.
 class TraceReader {
 public:
     /// `input` outlives the reader; `name` is what messages call it.

@@ -13,12 +13,12 @@
 
 #include "Decoder.h"
 #include "ErrorRates.h"
+#include "base/Error.h"
+#include "base/Thousandths.h"
 #include "link/Channel.h"
 #include "link/DefaultScale.h"
 #include "link/TurboEncoder.h"
 #include "rules/BlockSizes.h"
-#include "simulation/Error.h"
-#include "simulation/Thousandths.h"
 
 namespace py = pybind11;
 using namespace morvik::python;
@@ -232,8 +232,8 @@ py::dict fields(const morvik::simulation::ResultRow& row)
     fields["algorithm"] = morvik::simulation::algorithmName(row.point.algorithm);
     fields["scale_option"] = morvik::simulation::scaleOptionText(row.point.scaleOption);
     fields["iterations"] = row.point.iterations;
-    fields["ebn0_db"] = morvik::simulation::fromThousandths(row.point.milliDecibels);
-    fields["scale"] = morvik::simulation::fromThousandths(row.point.milliScale);
+    fields["ebn0_db"] = morvik::base::fromThousandths(row.point.milliDecibels);
+    fields["scale"] = morvik::base::fromThousandths(row.point.milliScale);
     fields["frames"] = row.frames.text();
     fields["blocks"] = row.frames.size();
     fields["bit_errors"] = row.errors.bitErrors;

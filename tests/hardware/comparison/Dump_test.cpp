@@ -8,7 +8,7 @@
 #include <string>
 #include <utility>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 
 namespace {
 
@@ -36,7 +36,7 @@ void expectRefused(Reader reader, const std::string& text, const std::string& me
     try {
         read(reader, text, map);
         FAIL() << "accepted";
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), message);
     }
 }
@@ -46,7 +46,7 @@ void expectMapRefused(const std::string& json, const std::string& message)
     try {
         mapOf(json);
         FAIL() << "accepted";
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), message);
     }
 }
@@ -107,7 +107,7 @@ TEST(Dump, RefusesWhatHasNoEndOrIsNoText)
             try {
                 reader(input, "dump", {}, dump);
                 FAIL() << "accepted";
-            } catch (const morvik::simulation::Error& error) {
+            } catch (const morvik::base::Error& error) {
                 EXPECT_EQ(error.what(), message);
             }
         };
@@ -121,7 +121,7 @@ TEST(Dump, RefusesWhatHasNoEndOrIsNoText)
     Endless blank("\n");
     std::istream input(&blank);
     Dump dump(2, 43);
-    EXPECT_THROW(readVcd(input, "dump", {}, dump), morvik::simulation::Error);
+    EXPECT_THROW(readVcd(input, "dump", {}, dump), morvik::base::Error);
 }
 
 TEST(CsvDump, ReadsAColumnForEachSignal)

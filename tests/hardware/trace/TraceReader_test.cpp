@@ -8,8 +8,8 @@
 #include <string>
 #include <vector>
 
+#include "base/Error.h"
 #include "hardware/testbench/Decoder.h"
-#include "simulation/Error.h"
 
 namespace {
 
@@ -33,7 +33,7 @@ void expectRefused(const std::string& text, const std::string& message)
     try {
         stepsOf(text);
         FAIL() << "accepted";
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), message);
     }
 }

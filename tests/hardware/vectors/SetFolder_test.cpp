@@ -37,7 +37,7 @@ TEST_F(SetFolder, LeavesTheEarlierOneWhenTheDiskIsFull)
     settings.blockSizes = {6144};
     {
         const morvik::support::SmallFiles small(20000);
-        EXPECT_THROW(make(), morvik::simulation::Error);
+        EXPECT_THROW(make(), morvik::base::Error);
     }
     EXPECT_EQ(read("manifest.json"), manifest);
     EXPECT_EQ(difference(), "none");
@@ -48,7 +48,7 @@ TEST_F(SetFolder, LeavesTheEarlierOneWhenTheDiskIsFull)
 TEST_F(SetFolder, LeavesNoFolderWhereItCouldNotBeMade)
 {
     const morvik::support::SmallFiles small(100);
-    EXPECT_THROW(make(), morvik::simulation::Error);
+    EXPECT_THROW(make(), morvik::base::Error);
     EXPECT_FALSE(std::filesystem::exists(path()));
 }
 
@@ -70,7 +70,7 @@ TEST_F(SetFolder, LeavesFilesOfOthersAlone)
     try {
         make();
         FAIL() << "accepted";
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(),
                   path() + "/stimulus.npy: is no file of the earlier set, and the new one has such a file");
     }
@@ -86,7 +86,7 @@ TEST_F(SetFolder, IsMadeByOneProcessAtATime)
         try {
             make();
             FAIL() << "accepted";
-        } catch (const morvik::simulation::Error& error) {
+        } catch (const morvik::base::Error& error) {
             EXPECT_EQ(
                 error.what(),
                 path() + ": another process is making a set in it; wait for that to end, or choose another folder");
@@ -160,7 +160,7 @@ TEST_F(SetFolder, LeavesTheEarlierOneWhenAFileCannotBeMoved)
         morvik::vectors::SetFolder set(path());
         std::filesystem::copy(folder.path("new"), set.aside());
         std::filesystem::create_directories(set.aside() + "/earlier/expected.csv");  // where the old one is to go
-        EXPECT_THROW(set.place(), morvik::simulation::Error);
+        EXPECT_THROW(set.place(), morvik::base::Error);
         EXPECT_EQ(read("manifest.json"), manifest);
         EXPECT_EQ(difference(), "none");
         std::filesystem::remove(set.aside() + "/earlier/expected.csv");
@@ -182,7 +182,7 @@ TEST_F(SetFolder, LeavesTheEarlierOneWhereAFolderHasTheNameOfAFile)
     try {
         make();
         FAIL() << "accepted";
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), path() + "/stimulus.csv: is a folder, the earlier set has a file of this name");
     }
     EXPECT_EQ(read("manifest.json"), manifest);
@@ -197,7 +197,7 @@ TEST_F(SetFolder, LeavesAloneWhatOthersKeepWhereUnfinishedOnesAre)
         try {
             make();
             FAIL() << "accepted";
-        } catch (const morvik::simulation::Error& error) {
+        } catch (const morvik::base::Error& error) {
             EXPECT_EQ(error.what(), message);
         }
     };
@@ -227,7 +227,7 @@ TEST_F(SetFolder, LeavesOtherFoldersAlone)
     try {
         make();
         FAIL() << "accepted";
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), path() + ": is not empty and holds no manifest.json of an earlier set");
     }
     EXPECT_EQ(read("mine.txt"), "x");
@@ -236,7 +236,7 @@ TEST_F(SetFolder, LeavesOtherFoldersAlone)
 TEST_F(SetFolder, CannotBeMadeInAFile)
 {
     folder.write("set", "x");
-    EXPECT_THROW(make(), morvik::simulation::Error);
+    EXPECT_THROW(make(), morvik::base::Error);
 }
 
 }  // namespace

@@ -5,8 +5,8 @@
 #include <string>
 #include <vector>
 
+#include "base/Error.h"
 #include "hardware/vectors/Formats.h"
-#include "simulation/Error.h"
 #include "support/TemporaryFolder.h"
 
 namespace {
@@ -63,7 +63,7 @@ void expectRefused(const std::string& format,
     try {
         read(*findFormat(format), folder.path(), file[0] == 'b' ? bits : pairs);
         FAIL() << "accepted: " << text;
-    } catch (const morvik::simulation::Error& error) {
+    } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(), folder.path() + '/' + message);
     }
 }
@@ -218,7 +218,7 @@ TEST(VectorFormats, ReportAMissingFile)
         try {
             read(format, folder.path(), pairs);
             FAIL() << format.name;
-        } catch (const morvik::simulation::Error& error) {
+        } catch (const morvik::base::Error& error) {
             EXPECT_EQ(error.what(),
                       folder.path() + '/' + format.files(pairs)[0] + ": cannot be opened: No such file or directory");
         }
@@ -228,7 +228,7 @@ TEST(VectorFormats, ReportAMissingFile)
 TEST(VectorFormats, ReportAFileThatCannotBeWritten)
 {
     for (const Format& format : formats()) {
-        EXPECT_THROW(write(format, "/dev/null", pairs, {{1, 1}}), morvik::simulation::Error) << format.name;
+        EXPECT_THROW(write(format, "/dev/null", pairs, {{1, 1}}), morvik::base::Error) << format.name;
     }
 }
 

@@ -10,9 +10,9 @@
 #include <string>
 #include <vector>
 
+#include "base/Error.h"
 #include "hardware/vectors/Checksum.h"
 #include "hardware/vectors/Set.h"
-#include "simulation/Error.h"
 #include "support/TemporaryFolder.h"
 
 namespace morvik::support {
@@ -80,7 +80,7 @@ protected:
         try {
             checkSet(path());
             FAIL() << "accepted";
-        } catch (const simulation::Error& error) {
+        } catch (const base::Error& error) {
             EXPECT_EQ(error.what(), message);
         }
     }

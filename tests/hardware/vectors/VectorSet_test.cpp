@@ -343,7 +343,7 @@ TEST(Checksum, IsThatOfTheStandard)
     EXPECT_EQ(sha256(folder.path("abc")), "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
     folder.write("new\nline", "abc");  // such names are shown in another way
     EXPECT_EQ(sha256(folder.path("new\nline")), "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
-    EXPECT_THROW(sha256(folder.path("missing")), morvik::simulation::Error);
+    EXPECT_THROW(sha256(folder.path("missing")), morvik::base::Error);
 }
 
 }  // namespace

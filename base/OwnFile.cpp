@@ -7,9 +7,9 @@
 #include <utility>
 
 #include "Error.h"
-#include "base/OutputFile.h"
+#include "OutputFile.h"
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 namespace {
 
@@ -30,7 +30,7 @@ OwnFile::OwnFile(std::string fileName) : itsName(std::move(fileName)), itsFile(-
     // Between the two steps the file may have gone, or another may have taken its place, with the lock on that one.
     constexpr int patience = 100;  // with a file system that tells files apart by nothing steady
     for (int i = 0; i < patience && !itsIsTaken && !itsFile.isAt(itsName); ++i) {
-        itsFile = base::Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
+        itsFile = Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
         itsIsTaken = itsFile.isOpen() && !itsFile.lock();
     }
 }
@@ -55,7 +55,7 @@ bool OwnFile::isNew() const
 void OwnFile::write(const std::string& content)
 {
     refuseOtherThanFile(itsName);
-    base::OutputFile file(itsName);
+    OutputFile file(itsName);
     file.lock();  // before it has the name
     file.secure();
     file.write(content);
@@ -69,4 +69,4 @@ void OwnFile::remove()
     }
 }
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base

@@ -9,16 +9,14 @@
 
 #include "Error.h"
 #include "FileKind.h"
-#include "base/Csv.h"
+#include "InputFile.h"
+#include "Text.h"
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 std::string readText(const std::string& fileName)
 {
-    std::ifstream file(fileName, std::ios::binary);
-    if (!file) {
-        throw fileError(fileName, "opened");
-    }
+    std::ifstream file = openFile(fileName);
     return readText(file, fileName, largestText);
 }
 
@@ -43,9 +41,7 @@ std::string readText(std::istream& file, const std::string& name, std::size_t la
     if (file.bad()) {
         throw fileError(name, "read");
     }
-    if (text.compare(0, base::byteOrderMark.size(), base::byteOrderMark) == 0) {
-        text.erase(0, base::byteOrderMark.size());
-    }
+    text.erase(0, text.size() - withoutMark(text).size());
     return text;
 }
 
@@ -58,4 +54,4 @@ void expectRegularFile(const std::string& fileName)
     }
 }
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base

@@ -1,5 +1,5 @@
 // Thousandths: what is read as a decimal of three places, and how it is written.
-#include "simulation/Thousandths.h"
+#include "base/Thousandths.h"
 
 #include <gtest/gtest.h>
 
@@ -7,7 +7,7 @@
 
 namespace {
 
-using namespace morvik::simulation;
+using namespace morvik::base;
 
 TEST(Thousandths, ReadsDecimals)
 {

@@ -1,12 +1,12 @@
 // TextFile: reads a file as a whole.
-#ifndef MORVIK_SIMULATION_TEXTFILE_H
-#define MORVIK_SIMULATION_TEXTFILE_H
+#ifndef MORVIK_BASE_TEXTFILE_H
+#define MORVIK_BASE_TEXTFILE_H
 
 #include <cstddef>
 #include <istream>
 #include <string>
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 /// As much as can be read: more than any file of results has.
 constexpr std::size_t largestText = std::size_t{1} << 28;
@@ -21,6 +21,6 @@ void expectRegularFile(const std::string& fileName);
 /// What readText(fileName) gives of an open file, which messages call `name`, of at most so many bytes.
 std::string readText(std::istream& file, const std::string& name, std::size_t largest);
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base
 
 #endif

@@ -10,7 +10,7 @@
 #include <cerrno>
 #include <system_error>
 
-namespace morvik::report {
+namespace morvik::base {
 
 namespace {
 
@@ -122,4 +122,4 @@ Outcome runProgram(const std::vector<std::string>& commandLine, const std::strin
     return {WIFEXITED(status) && WEXITSTATUS(status) == 0, out.content(), err.content()};
 }
 
-}  // namespace morvik::report
+}  // namespace morvik::base

@@ -1,11 +1,11 @@
 // ChildProcess: another program run to its end, without a shell between.
-#ifndef MORVIK_REPORT_CHILDPROCESS_H
-#define MORVIK_REPORT_CHILDPROCESS_H
+#ifndef MORVIK_BASE_CHILDPROCESS_H
+#define MORVIK_BASE_CHILDPROCESS_H
 
 #include <string>
 #include <vector>
 
-namespace morvik::report {
+namespace morvik::base {
 
 /// What a program leaves behind.
 struct Outcome {
@@ -18,6 +18,6 @@ struct Outcome {
 /// std::system_error when it cannot be started.
 Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input);
 
-}  // namespace morvik::report
+}  // namespace morvik::base
 
 #endif

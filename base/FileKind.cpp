@@ -3,7 +3,7 @@
 
 #include <array>
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 namespace {
 
@@ -40,4 +40,4 @@ const char* whyNoText(std::string_view beginning)
     return nullptr;
 }
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base

@@ -1,12 +1,12 @@
 // Thousandths: decimal numbers with three places, as integers, so that no result depends on how a decimal was rounded.
-#ifndef MORVIK_SIMULATION_THOUSANDTHS_H
-#define MORVIK_SIMULATION_THOUSANDTHS_H
+#ifndef MORVIK_BASE_THOUSANDTHS_H
+#define MORVIK_BASE_THOUSANDTHS_H
 
 #include <optional>
 #include <string>
 #include <string_view>
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 /// The number that the whole text writes in decimal, times 1000; nothing if it has more than three decimals, or
 /// more than six digits before them, or is no such number at all.
@@ -21,6 +21,6 @@ inline double fromThousandths(int thousandths)
     return thousandths / 1000.0;
 }
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base
 
 #endif

@@ -1,5 +1,5 @@
 // OwnFile: one at a time has the file, and the system takes it back from the dead.
-#include "simulation/OwnFile.h"
+#include "base/OwnFile.h"
 
 #include <gtest/gtest.h>
 #include <signal.h>
@@ -8,12 +8,12 @@
 
 #include <filesystem>
 
-#include "simulation/Error.h"
+#include "base/Error.h"
 #include "support/TemporaryFolder.h"
 
 namespace {
 
-using morvik::simulation::OwnFile;
+using morvik::base::OwnFile;
 
 class OwnFiles : public testing::Test {
 protected:
@@ -88,20 +88,20 @@ TEST_F(OwnFiles, ThatCannotBeOpenedTellWhenTheyAreWritten)
 {
     OwnFile file(folder.path("none/file"));
     EXPECT_FALSE(file.isTaken());
-    EXPECT_THROW(file.write("x"), morvik::simulation::Error);
+    EXPECT_THROW(file.write("x"), morvik::base::Error);
 }
 
 TEST_F(OwnFiles, AreNoLinksToOthers)
 {
     folder.write("another", "kept");
     std::filesystem::create_symlink("another", name);
-    EXPECT_THROW(OwnFile{name}, morvik::simulation::Error);
+    EXPECT_THROW(OwnFile{name}, morvik::base::Error);
     unlink(name.c_str());
     {
         OwnFile file(name);
         unlink(name.c_str());
         std::filesystem::create_symlink("another", name);
-        EXPECT_THROW(file.write("x"), morvik::simulation::Error);
+        EXPECT_THROW(file.write("x"), morvik::base::Error);
     }
     EXPECT_EQ(folder.read("another"), "kept");
     EXPECT_EQ(folder.names(), (std::vector<std::string>{"another", "file"}));

@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <cstdlib>
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 namespace {
 
@@ -53,4 +53,4 @@ std::string thousandthsText(int thousandths)
     return (thousandths < 0 ? "-" : "") + std::to_string(size / 1000) + (fraction.empty() ? "" : '.' + fraction);
 }
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base

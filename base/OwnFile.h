@@ -1,12 +1,12 @@
 // OwnFile: a file that one process at a time has for itself.
-#ifndef MORVIK_SIMULATION_OWNFILE_H
-#define MORVIK_SIMULATION_OWNFILE_H
+#ifndef MORVIK_BASE_OWNFILE_H
+#define MORVIK_BASE_OWNFILE_H
 
 #include <string>
 
-#include "base/Descriptor.h"
+#include "Descriptor.h"
 
-namespace morvik::simulation {
+namespace morvik::base {
 
 /// Has a file, from before it is there until it is removed or the process ends. The file itself is what is locked, so
 /// that there is no other that a killed process could leave. A new one is empty until it is written, and goes with the
@@ -34,10 +34,10 @@ public:
 
 private:
     std::string itsName;
-    base::Descriptor itsFile;
+    Descriptor itsFile;
     bool itsIsTaken = false;
 };
 
-}  // namespace morvik::simulation
+}  // namespace morvik::base
 
 #endif

@@ -1,5 +1,5 @@
 // Files that are no text, by their first bytes.
-#include "simulation/FileKind.h"
+#include "base/FileKind.h"
 
 #include <gtest/gtest.h>
 
@@ -7,7 +7,7 @@
 
 namespace {
 
-using morvik::simulation::whyNoText;
+using morvik::base::whyNoText;
 using namespace std::string_literals;
 
 TEST(FileKind, KnowsWhatIsNoText)

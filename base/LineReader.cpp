@@ -1,0 +1,96 @@
+// LineReader: a text read line by line, whatever it is and however long, with the places for messages.
+#include "LineReader.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "Error.h"
+#include "FileKind.h"
+#include "Text.h"
+
+namespace morvik::base {
+
+namespace {
+
+constexpr std::size_t usualBuffer = 8192;
+
+std::string placeOf(const std::string& name, std::size_t line)
+{
+    return name + ':' + std::to_string(line);
+}
+
+}  // namespace
+
+LineReader::LineReader(std::istream& input, std::string name, std::size_t longest)
+    : itsInput(input), itsName(std::move(name)), itsLongest(longest), itsBuffer(usualBuffer)
+{
+}
+
+bool LineReader::next()
+{
+    const std::size_t length = readLine();
+    if (itsInput.bad()) {
+        throw fileError(placeOf(itsName, itsNumber + 1), "read");
+    }
+    itsText = std::string_view(itsBuffer.data(), length);
+    if (itsNumber == 0) {
+        itsText = withoutMark(itsText);
+        if (const char* const reason = whyNoText(itsText)) {
+            throw Error(itsName + ": " + reason);
+        }
+    }
+    if (itsInput.eof() && length == 0) {
+        return false;
+    }
+    ++itsNumber;
+    if (!itsText.empty() && itsText.back() == '\r') {
+        itsText.remove_suffix(1);
+    }
+    if (itsText.size() > itsLongest) {
+        fail("line is too long, allowed are " + std::to_string(itsLongest) + " characters");
+    }
+    return true;
+}
+
+std::string LineReader::place() const
+{
+    return placeOf(itsName, std::max<std::size_t>(itsNumber, 1));
+}
+
+void LineReader::expectAnEnd(std::size_t first) const
+{
+    if (itsNumber - first >= mostBlank) {
+        failAt(first, "blank lines without an end, allowed are " + std::to_string(mostBlank));
+    }
+}
+
+void LineReader::fail(const std::string& what) const
+{
+    throw Error(place() + ": " + what);
+}
+
+void LineReader::failAt(std::size_t line, const std::string& what) const
+{
+    throw Error(placeOf(itsName, line) + ": " + what);
+}
+
+/// Reads a line into the buffer, of a long one as much as tells that it is too long. Returns its length.
+std::size_t LineReader::readLine()
+{
+    const std::size_t most = byteOrderMark.size() + itsLongest + 1 + 1 + 1;  // \r, one too many, and a null at the end
+    for (std::size_t length = 0;;) {
+        itsInput.getline(itsBuffer.data() + length, static_cast<std::streamsize>(itsBuffer.size() - length));
+        length += static_cast<std::size_t>(itsInput.gcount());
+        if (itsInput.good()) {
+            return length - 1;  // gcount() includes the \n
+        }
+        const bool isFull = itsInput.fail() && length + 1 == itsBuffer.size() && !itsInput.eof() && !itsInput.bad();
+        if (!isFull || itsBuffer.size() >= most) {
+            return length;
+        }
+        itsInput.clear();
+        itsBuffer.resize(std::min(2 * itsBuffer.size(), most));
+    }
+}
+
+}  // namespace morvik::base
