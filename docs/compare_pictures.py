@@ -2,7 +2,7 @@
 """Draws the pictures of docs/compare.md: compare_steps.svg and compare_passes.svg, beside this file.
 
 They show the dump of a core with a fault beside the model. Needs both built:
-scripts/build x86_64 morvik fault_cores
+scripts/build x86_64 morvik fault_core
 """
 
 import csv
@@ -31,7 +31,7 @@ def model():
 def dump():
     """The same of forward border columns that keep their low bits, as far as it goes."""
     with open(BLOCK) as block:
-        rows = csv.DictReader(output_of(BUILD / "tests/faults/fault_forward_bits_kept", "2", "1", "8", stdin=block))
+        rows = csv.DictReader(output_of(BUILD / "tests/faults/fault_core", "forward_bits_kept", "2", "1", "8", stdin=block))
         return {(int(row["half_iteration"]), int(row["step"]), row["signal"]): int(row["value"]) for row in rows}
 
 

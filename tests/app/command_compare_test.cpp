@@ -61,8 +61,8 @@ protected:
     /// Has a core with the fault write rtl.csv.
     void writeDump(const std::string& fault, int units, int algorithm) const
     {
-        const CommandRunner core(MORVIK_FAULT_CORES "/fault_" + fault);
-        const CommandResult result = core.run({std::to_string(units), std::to_string(algorithm), "4"},
+        const CommandRunner core(MORVIK_FAULT_CORE);
+        const CommandResult result = core.run({fault, std::to_string(units), std::to_string(algorithm), "4"},
                                               morvik.directory() + "/block.csv",
                                               morvik.directory() + "/rtl.csv");
         ASSERT_EQ(result.status, 0) << result.err;
@@ -235,6 +235,15 @@ TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
         EXPECT_EQ(result.out, "core: 4 units, " + name + ", 4 iterations\nrtl.csv: " + allOf1088);
         EXPECT_EQ(result.err, "");
     }
+}
+
+// The cores with a fault at a border have recursions of their own.
+TEST_F(Compare, FindsNoDifferenceInCoresWithOwnRecursions)
+{
+    writeBlock(1088);
+    writeDump("borders_alone", 2, 1);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.out, usualCore + "rtl.csv: " + allOf1088);
 }
 
 TEST_F(Compare, AgreesWithTheTraceOfTheModel)

@@ -1,0 +1,388 @@
+// KernelFaults: wrong branch metrics, recursions and log-likelihood ratios.
+#include <algorithm>
+#include <array>
+#include <utility>
+
+#include "Fault.h"
+#include "rules/Arithmetic.h"
+#include "rules/Trellis.h"
+#include "rules/TrellisDecision.h"
+
+namespace morvik::faults {
+
+namespace {
+
+using arithmetic::clip;
+using arithmetic::wrap16;
+
+constexpr int lowestBranch = -2048;
+constexpr int highestBranch = 2032;
+
+/// An engine with the settings of another.
+class FaultyEngine : public TCalculationEngineModBase {
+public:
+    explicit FaultyEngine(const TCalculationEngineModBase& sound) : TCalculationEngineModBase(sound) {}
+
+    std::string getProperties() const override
+    {
+        return "faulty";
+    }
+};
+
+/// Branch metrics by another formula.
+class OtherBranches : public FaultyEngine {
+public:
+    using FaultyEngine::FaultyEngine;
+
+    T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short*, T8* g) override
+    {
+        for (unsigned k = 0; k < n; ++k) {
+            const int i = 2 * intrinsic[k];
+            const int p = parity0[k];
+            const std::array<int, 4> sums = {i + p, i - p, i - p, i + p};
+            for (unsigned metric = 0; metric < sums.size(); ++metric) {
+                const bool parityIsNegated = metric == 1 || metric == 2;
+                g[k][metric] = branch(sums[metric], parityIsNegated && p == -2048);
+            }
+        }
+        return g + n;
+    }
+
+private:
+    /// A branch metric from its sum; the most negative parity may be negated in it.
+    virtual short branch(int sum, bool lowestParityNegated) const = 0;
+};
+
+class UnclippedBranches : public OtherBranches {
+    using OtherBranches::OtherBranches;
+
+    short branch(int sum, bool) const override
+    {
+        return wrap16(sum);
+    }
+};
+
+class BranchesOfEightBits : public OtherBranches {
+    using OtherBranches::OtherBranches;
+
+    short branch(int sum, bool) const override
+    {
+        return wrap16(static_cast<signed char>(sum / 16) * 16);
+    }
+};
+
+class BranchesOfSevenBits : public OtherBranches {
+    using OtherBranches::OtherBranches;
+
+    short branch(int sum, bool) const override
+    {
+        return wrap16(clip(sum, lowestBranch / 2, highestBranch / 2 - 8));
+    }
+};
+
+class ParityNegatedInEight : public OtherBranches {
+    using OtherBranches::OtherBranches;
+
+    /// In eight bits, -128 negated stays -128.
+    short branch(int sum, bool lowestParityNegated) const override
+    {
+        return wrap16(clip(lowestParityNegated ? sum - 4096 : sum, lowestBranch, highestBranch));
+    }
+};
+
+class NegatedParity : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) override
+    {
+        std::vector<short> negated(parity0, parity0 + n);
+        for (short& value : negated) {
+            value = wrap16(-value);
+        }
+        return FaultyEngine::gamma(n, intrinsic, negated.data(), parity1, g);
+    }
+};
+
+class IntrinsicDoubledInEight : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    T8* gamma(unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) override
+    {
+        std::vector<short> cut(intrinsic, intrinsic + n);
+        for (short& value : cut) {
+            value = wrap16(8 * static_cast<signed char>(2 * value / 16));
+        }
+        return FaultyEngine::gamma(n, cut.data(), parity0, parity1, g);
+    }
+};
+
+class BackwardUncorrected : public FaultyEngine {
+public:
+    explicit BackwardUncorrected(const TCalculationEngineModBase& sound) : FaultyEngine(sound)
+    {
+        itsBetaAlgorithmType = MOD;
+    }
+};
+
+class ForwardCorrectedEarly : public FaultyEngine {
+public:
+    explicit ForwardCorrectedEarly(const TCalculationEngineModBase& sound) : FaultyEngine(sound)
+    {
+        itsAlphaAlgorithmType = MOD_STAR;
+    }
+};
+
+/// Each column is altered as soon as it is computed, and the next one is computed from it. It suits max-log-MAP, of
+/// whose decisions nothing is pending from one step to the next.
+class AlteredColumns : public FaultyEngine {
+public:
+    using FaultyEngine::FaultyEngine;
+
+    T8* alpha(unsigned n, const T8* g, T8* a) override
+    {
+        for (unsigned j = 1; j < n; ++j) {
+            FaultyEngine::alpha(2, g + j - 1, a + j - 1);
+            alterForward(a[j]);
+        }
+        return a + n;
+    }
+
+    T8* beta(unsigned n, const T8* g, T8* b) override
+    {
+        for (unsigned j = 1; j < n; ++j) {
+            FaultyEngine::beta(2, g - (j - 1), b - (j - 1));
+            alterBackward(*(b - j));
+        }
+        return b - n;
+    }
+
+private:
+    virtual void alterForward(T8& column) const = 0;
+    virtual void alterBackward(T8& column) const = 0;
+};
+
+class StatesSwapped : public AlteredColumns {
+    using AlteredColumns::AlteredColumns;
+
+    void alterForward(T8& column) const override
+    {
+        std::swap(column[2], column[3]);
+    }
+
+    void alterBackward(T8&) const override {}
+};
+
+void cutToElevenBits(T8& column)
+{
+    for (short& metric : column.metric) {
+        metric = static_cast<short>(wrap16(2 * metric) / 2);
+    }
+}
+
+class StoredInElevenBits : public AlteredColumns {
+    using AlteredColumns::AlteredColumns;
+
+    void alterForward(T8& column) const override
+    {
+        cutToElevenBits(column);
+    }
+
+    void alterBackward(T8& column) const override
+    {
+        cutToElevenBits(column);
+    }
+};
+
+/// The recursions go on with twelve bits.
+class KeptInElevenBits : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    T8* alpha(unsigned n, const T8* g, T8* a) override
+    {
+        T8* const end = FaultyEngine::alpha(n, g, a);
+        std::for_each(a + 1, a + n, cutToElevenBits);
+        return end;
+    }
+
+    T8* beta(unsigned n, const T8* g, T8* b) override
+    {
+        T8* const end = FaultyEngine::beta(n, g, b);
+        std::for_each(b - (n - 1), b, cutToElevenBits);
+        return end;
+    }
+};
+
+/// Log-likelihood ratios that are altered once they are computed.
+class NegatedRatios : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        short* const end = FaultyEngine::llr(n, a, b, g, out);
+        std::transform(out, out + n, out, [](short ratio) { return wrap16(-ratio); });
+        return end;
+    }
+};
+
+class RoundedRatios : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        short* const end = FaultyEngine::llr(n, a, b, g, out);
+        for (unsigned k = 0; k < n; ++k) {
+            out[k] = wrap16(out[k] + (a[k][0] & 16));
+        }
+        return end;
+    }
+};
+
+/// A metric in other arithmetic than that of 16 bits which wrap: Sum gives the sum's value.
+template <class Sum>
+struct Metric {
+    short value;
+
+    friend constexpr Metric addWrap(Metric a, Metric b)
+    {
+        return {Sum::of(a.value + b.value)};
+    }
+
+    friend constexpr Metric subWrap(Metric a, Metric b)
+    {
+        return {Sum::of(a.value - b.value)};
+    }
+
+    friend constexpr Metric maxWrap(Metric a, Metric b)
+    {
+        return subWrap(a, b).value < 0 ? b : a;
+    }
+};
+
+struct Saturated {
+    static constexpr short of(int sum)
+    {
+        return wrap16(clip(sum, -32768, 32752));
+    }
+};
+
+struct ElevenBits {
+    static constexpr short of(int sum)
+    {
+        return static_cast<short>(wrap16(2 * sum) / 2);
+    }
+};
+
+template <class Sum>
+std::array<Metric<Sum>, trellis::stateCount> metrics(const T8& column)
+{
+    std::array<Metric<Sum>, trellis::stateCount> values{};
+    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+        values[state].value = column[state];
+    }
+    return values;
+}
+
+template <class Sum>
+trellis::BranchMetrics<Metric<Sum>> branches(const T8& g)
+{
+    return {{{g[0]}, {g[1]}, {g[2]}, {g[3]}}};
+}
+
+template <class Sum>
+void store(const std::array<Metric<Sum>, trellis::stateCount>& values, T8& column)
+{
+    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+        column[state] = values[state].value;
+    }
+}
+
+/// Ratios of max-log-MAP in another arithmetic.
+template <class Sum>
+class OtherRatios : public FaultyEngine {
+public:
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        for (unsigned k = 0; k < n; ++k) {
+            out[k] =
+                trellis::logLikelihoodRatio(itsRule, metrics<Sum>(a[k]), metrics<Sum>(b[k]), branches<Sum>(g[k])).value;
+        }
+        return out + n;
+    }
+
+protected:
+    trellis::DecideMax<Metric<Sum>> itsRule;
+};
+
+/// All of max-log-MAP in another arithmetic.
+template <class Sum>
+class OtherMetrics : public OtherRatios<Sum> {
+public:
+    using OtherRatios<Sum>::OtherRatios;
+
+    T8* alpha(unsigned n, const T8* g, T8* a) override
+    {
+        for (unsigned j = 1; j < n; ++j) {
+            store(trellis::forwardStep(this->itsRule, metrics<Sum>(a[j - 1]), branches<Sum>(g[j - 1])), a[j]);
+        }
+        return a + n;
+    }
+
+    T8* beta(unsigned n, const T8* g, T8* b) override
+    {
+        for (unsigned j = 1; j < n; ++j, --g, --b) {
+            store(trellis::backwardStep(this->itsRule, metrics<Sum>(*b), branches<Sum>(*g)), *(b - 1));
+        }
+        return b - 1;
+    }
+};
+
+/// The last subtraction of a ratio is wider and saturates.
+class UnwrappedRatios : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        const trellis::DecideMax<short> rule;
+        const auto column = [](const T8& values) {
+            std::array<short, trellis::stateCount> copy{};
+            std::copy_n(values.metric, copy.size(), copy.begin());
+            return copy;
+        };
+        for (unsigned k = 0; k < n; ++k) {
+            const trellis::BranchMetrics<short> of = {g[k][0], g[k][1], g[k][2], g[k][3]};
+            const int one = trellis::bestPath<1>(rule, column(a[k]), column(b[k]), of);
+            const int zero = trellis::bestPath<0>(rule, column(a[k]), column(b[k]), of);
+            out[k] = Saturated::of(one - zero);
+        }
+        return out + n;
+    }
+};
+
+}  // namespace
+
+const std::vector<Fault>& kernelFaults()
+{
+    static const std::vector<Fault> faults = {
+        inEngine<UnclippedBranches>("branch_unclipped"),
+        inEngine<BranchesOfEightBits>("branch_eight_bits"),
+        inEngine<BranchesOfSevenBits>("branch_seven_bits"),
+        inEngine<NegatedParity>("parity_sign"),
+        inEngine<ParityNegatedInEight>("parity_negated_in_eight"),
+        inEngine<IntrinsicDoubledInEight>("doubled_in_eight"),
+        inEngine<BackwardUncorrected>("backward_uncorrected"),
+        inEngine<ForwardCorrectedEarly>("forward_corrected_early"),
+        inEngine<StatesSwapped>("forward_state_swapped"),
+        inEngine<OtherMetrics<Saturated>>("metrics_unwrapped"),
+        inEngine<OtherMetrics<ElevenBits>>("metrics_eleven_bits"),
+        inEngine<StoredInElevenBits>("metrics_stored_in_eleven_bits"),
+        inEngine<KeptInElevenBits>("metrics_kept_in_eleven_bits"),
+        inEngine<NegatedRatios>("ratio_sign"),
+        inEngine<RoundedRatios>("ratio_rounding"),
+        inEngine<UnwrappedRatios>("ratio_unwrapped"),
+    };
+    return faults;
+}
+
+}  // namespace morvik::faults
