@@ -97,8 +97,12 @@ EQUIVALENT = {
     "src/LanePath.cpp": [
         ("a last block of the same size is dropped again at once", [("K < lastK", "K <= lastK")]),
     ],
+    "src/ComponentPath.cpp": [
+        ("room for more values than there are", [("reserve(3 *", "reserve(4 *")]),
+    ],
     "src/MissedBlocks.cpp": [
         ("the three streams of a block are of one length", [("block.input[0].size()", "block.input[1].size()")]),
+        ("a block of the same size writes what it left once more", [("back().K <= K", "back().K < K")]),
     ],
     "src/morvik_v1_0_bitacc_cmodel.cpp": [
         ("room for more tags than there are", [("tags_alloc = 1", "tags_alloc = 2")]),

@@ -13,15 +13,14 @@ class BlockPath {
 public:
     virtual ~BlockPath() = default;
 
-    /// Takes in up to `most` blocks, 1 or more, from block `first` on; returns how many. Reports the first value of a
-    /// state's life that is clipped, and before it a tag that is truncated, of a block before. Exhausted memory
-    /// leaves it as an exception.
+    /// Takes in blocks from block `first` on, at most `most` and at least 1; returns how many. Warns of a value that is
+    /// clipped, and first of the tag of an earlier block. Exhausted memory throws std::bad_alloc.
     virtual unsigned take(const simulation_call::Batch& batch, std::size_t first, unsigned most) = 0;
 
     virtual simulation_call::Status decode(unsigned iterations) = 0;
 
-    /// Decodes, and counts for each block the decisions that differ from `sent` after each full iteration. `sent`
-    /// and `errors` begin with the first block that was taken.
+    /// Decodes, and after each full iteration counts the decisions of each block that differ from `sent`. Both arrays
+    /// begin with the first block that was taken.
     virtual simulation_call::Status countErrors(unsigned iterations,
                                                 const std::uint8_t* sent,
                                                 std::uint32_t* errors) = 0;
@@ -29,7 +28,7 @@ public:
     /// Decisions of each block.
     virtual std::size_t blockSize() const = 0;
 
-    /// Of the blocks that were taken, one after the other.
+    /// What the blocks that were taken give, one block after the other.
     virtual void decisions(std::uint8_t* to) = 0;
     virtual void ratios(std::int16_t* to) = 0;
 

@@ -12,7 +12,7 @@ using simulation_call::Status;
 
 namespace {
 
-/// Calls the decoder, whose metric columns must be as if it had decoded all blocks before, and says how it ended.
+/// Calls decode(decoder) when the metric columns are what all earlier blocks left; returns how it ended.
 template <class Decode>
 Status decodeWith(veltra_ip_morvik_v1_0_state& state, Decode decode)
 {

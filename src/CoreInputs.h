@@ -44,7 +44,7 @@ void forEachSoftValue(State& state, const simulation_call::Batch& batch, std::si
                 std::int32_t excess = 0;
                 const auto value = std::int32_t{lanes::valueAt(streams[s], static_cast<std::size_t>(i))};
                 const std::int32_t kept = inputInteger(value, *state.input_format, excess);
-                if (excess != 0 && !state.saturation_reported) {
+                if (!state.saturation_reported && excess != 0) {
                     reportSaturation(state, s, i, excess > 0);
                 }
                 use(s, i, kept);

@@ -114,7 +114,7 @@ bool LanePath::load(const Batch& batch, const lanes::Streams<Input>& all, std::s
     return itsLanes->load(blocks.data(), most);
 }
 
-/// Warnings come in the order of single calls: a block's tag before the values of the next one.
+/// Warnings come in the order of single calls: that of a block's tag before those of the next block's values.
 void LanePath::loadClipped(const Batch& batch, std::size_t first)
 {
     const auto size = static_cast<std::size_t>(batch.dinSize);

@@ -15,8 +15,7 @@
 #include "lanes/InstructionSets.h"
 #include "lanes/LaneDecoder.h"
 
-/// Keeps the counters of the state's decoder, which has to be the original one, and tells the missed blocks what it has
-/// decoded.
+/// Keeps the counters of the state's original decoder, and hands over the blocks that this misses.
 class LanePath : public BlockPath {
 public:
     LanePath(veltra_ip_morvik_v1_0_state& state,
@@ -34,10 +33,10 @@ public:
     void decisions(std::uint8_t* to) override;
     void ratios(std::int16_t* to) override;
 
-    /// Adds the last block that was decoded to the missed ones: of blocks of one size its columns remain.
+    /// Adds the last decoded block to the missed ones: of blocks of one size only its columns would remain.
     void handOverLastBlock();
 
-    /// The blocks that were taken last are not the decoder's.
+    /// Hands over nothing of what was decoded so far.
     void forgetBlocks();
 
 private:

@@ -7,9 +7,9 @@
 #include "OriginalComponents.h"
 #include "lanes/LaneDecoder.h"
 
-/// A trace shows cells of the metric columns that no computation of its own block writes, with what earlier blocks
-/// left there. The lanes write no columns; so before the components work again, those of the blocks that they missed
-/// are computed. Only few are needed: a block leaves nothing of earlier ones that are not longer.
+/// A trace also shows cells of the metric columns that its own block does not write: what earlier blocks left there.
+/// The lanes write no columns. Before the components work again, this computes the columns of the blocks that they
+/// missed. Few blocks are enough: each overwrites what earlier ones of its size or less have left.
 class MissedBlocks {
 public:
     explicit MissedBlocks(OriginalComponents& originals) : itsOriginals(originals) {}
@@ -17,13 +17,13 @@ public:
     /// Adds a block that the lanes have decoded.
     void add(lanes::LoadedBlock input, unsigned K, unsigned iterations);
 
-    /// A block of K bits is going to be decoded over them.
+    /// Drops the blocks that a decode of K bits overwrites.
     void overwrite(unsigned K);
 
-    /// The columns are those of a decoder that has not decoded them.
+    /// Drops all blocks: the state has another decoder.
     void forget();
 
-    /// Leaves the columns of the original decoder as they would be had it decoded these blocks.
+    /// Makes the columns of the original decoder what they would be had it decoded these blocks.
     void computeColumns();
 
 private:

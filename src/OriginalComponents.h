@@ -9,8 +9,8 @@
 #include "DecoderState.h"
 #include "TDecoder3GPU.h"
 
-/// A test bench may put other components into a state, or change what they hold: these then no longer tell how it
-/// decodes.
+/// A test bench may put other components into a state, or change what they hold. The state then no longer decodes as
+/// its generics say.
 class OriginalComponents {
 public:
     using State = veltra_ip_morvik_v1_0_state;

@@ -13,15 +13,14 @@ public:
     /// For a state whose components have just been made; it must outlive this.
     PathChoice(State& state, const lanes::InstructionSet& instructionSet);
 
-    /// The lanes, where they decode a block of K bits as the state's components would and nobody watches those;
-    /// null where the components have to. Exhausted memory throws std::bad_alloc.
+    /// The lanes, ready for blocks of K bits; null where the components have to decode: somebody watches them, has
+    /// changed them or asks for them, or K is no block size. Exhausted memory throws std::bad_alloc.
     LanePath* lanesFor(unsigned K);
 
-    /// Leaves the decoder's metric columns as they would be had it decoded everything itself.
+    /// Makes the decoder's metric columns what they would be had it decoded every block itself.
     void catchUp();
 
-    /// What the lanes are computed with; null where the components have to decode for want of their own originals,
-    /// or have been asked for.
+    /// What the lanes run on; null while the components are asked for or changed.
     const lanes::InstructionSet* instructionSet() const;
     void useLanes(const lanes::InstructionSet& instructionSet);
     void useComponents();

@@ -88,8 +88,8 @@ const char* shortArray(const Outputs& outputs, std::size_t blocks, std::size_t K
                                                                    : nullptr;
 }
 
-/// Lets a path take in a batch, some blocks at a time, and calls decode(path, first, taken) for each lot. The first
-/// block may be wanted as a lot of its own.
+/// Lets a path take in the blocks of a batch, some at a time, and calls decode(path, first, taken) after each time.
+/// `firstAlone`: the first time it takes one block.
 template <class Decode>
 Status sendBy(BlockPath& path, const Batch& batch, bool firstAlone, Decode decode)
 {
@@ -103,7 +103,8 @@ Status sendBy(BlockPath& path, const Batch& batch, bool firstAlone, Decode decod
     return success;
 }
 
-/// Sends a batch by the lanes, where they take it, else by the components, which guard their decoder alone.
+/// Sends a batch through the lanes where they can decode it, else through the components, which guard the decoder
+/// alone.
 template <class Decode>
 Status send(State& state, const Batch& batch, bool firstAlone, Decode decode)
 {
@@ -142,7 +143,7 @@ void deliver(State& state, const Batch& batch, BlockPath& path, std::size_t firs
 
 }  // namespace
 
-/// Room is what is looked at last: where it lacks, the first block is decoded, and counts, before all are refused.
+/// Room is checked last: where it lacks, the first block is decoded, and counted, before all are refused.
 Status simulate(State* state, const Batch& batch, Outputs* outputs)
 {
     if (const char* reason = checkArguments(state, outputFault(outputs), batch)) {

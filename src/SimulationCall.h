@@ -19,9 +19,8 @@ struct ErrorCounts {
     std::size_t room;
 };
 
-/// Decodes a batch, and delivers decisions, ratios and tags, or counts errors: all calls of the C headers come here.
-/// The components' soft values are built before the decoder is called: memory exhausted at that moment leaves these
-/// functions as an exception. All else is a status.
+/// Every call of the C headers comes here. Exhausted memory becomes a status, but for that of the components' soft
+/// values, which are built before the decoder is called: it leaves as an exception.
 Status simulate(veltra_ip_morvik_v1_0_state* state, const Batch& batch, veltra_ip_morvik_v1_0_batch_outputs* outputs);
 Status countErrors(veltra_ip_morvik_v1_0_state* state, const Batch& batch, const ErrorCounts& counts);
 
