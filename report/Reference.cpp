@@ -13,6 +13,9 @@
 #include "base/Shown.h"
 #include "base/Text.h"
 #include "base/TextFile.h"
+#include "rules/BlockSizes.h"
+#include "simulation/Frames.h"
+#include "simulation/Possible.h"
 #include "simulation/ResultFiles.h"
 
 namespace morvik::report {
@@ -51,6 +54,11 @@ private:
     [[noreturn]] void fail(const std::string& what) const
     {
         itsLines.fail(what);
+    }
+
+    [[noreturn]] void refuse(const std::string& column, const std::string& allowed) const
+    {
+        fail(base::shown(text(column)) + " in the column " + column + " is not allowed, allowed are " + allowed);
     }
 
     void take(std::string_view line)
@@ -111,18 +119,55 @@ private:
         row.setting = setting();
         row.sample = sample();
         checkCounts(row);
+        checkRun(row.sample.blocks);
         itsRows.push_back(row);
     }
 
     Setting setting() const
     {
         Setting setting;
-        setting.blockSize = static_cast<unsigned>(count("block_size", UINT32_MAX));
-        setting.numPu = static_cast<unsigned>(count("num_pu", UINT32_MAX));
+        setting.blockSize = blockSize();
+        setting.numPu = numPu();
         setting.algorithm = text("algorithm");
         setting.iterations = static_cast<unsigned>(count("iterations", UINT32_MAX));
         setting.scale = text("scale_option");
         return setting;
+    }
+
+    unsigned blockSize() const
+    {
+        const auto K = static_cast<unsigned>(count("block_size", UINT32_MAX));
+        if (!text("block_size").empty() && standard::findBlockSize(K) == nullptr) {
+            refuse("block_size", "the block sizes of 3GPP TS 36.212, 40 to 6144");
+        }
+        return K;
+    }
+
+    unsigned numPu() const
+    {
+        const auto units = static_cast<unsigned>(count("num_pu", UINT32_MAX));
+        if (!text("num_pu").empty() && units != 2 && units != 4 && units != 8) {
+            refuse("num_pu", "2, 4 and 8");
+        }
+        return units;
+    }
+
+    /// Checks what is not drawn, but tells that a file of results was damaged.
+    void checkRun(std::uint64_t blocks) const
+    {
+        const std::string seconds = text("seconds");
+        if (!seconds.empty() && !simulation::isPossibleTime(base::parseNumber<double>(seconds).value_or(-1))) {
+            refuse("seconds", "the numbers from 0 to 1e+12");
+        }
+        count("seed", UINT64_MAX);
+        const std::string frames = text("frames");
+        if (frames.empty() || base::parseNumber<std::uint64_t>(frames)) {
+            return;
+        }
+        const auto ranges = simulation::FrameSet::parse(frames);
+        if (!ranges || (blocks > 0 && ranges->size() != blocks)) {
+            refuse("frames", "a number, or ranges FROM:TO of as many frames as there are blocks");
+        }
     }
 
     Sample sample() const
@@ -199,8 +244,7 @@ private:
         }
         const auto value = base::parseNumber<double>(field);
         if (!value || !(*value >= min && *value <= max)) {
-            fail(base::shown(field) + " in the column " + column + " is not allowed, allowed are numbers from " +
-                 base::numberText(min) + " to " + base::numberText(max));
+            refuse(column, "numbers from " + base::numberText(min) + " to " + base::numberText(max));
         }
         return *value;
     }
@@ -213,8 +257,7 @@ private:
         }
         const auto value = base::parseNumber<std::uint64_t>(field);
         if (!value || *value > max) {
-            fail(base::shown(field) + " in the column " + column + " is not allowed, allowed are the integers 0 to " +
-                 std::to_string(max));
+            refuse(column, "the integers 0 to " + std::to_string(max));
         }
         return *value;
     }

@@ -51,7 +51,12 @@ bool readIterations(std::string_view text, ResultRow& row)
 bool readScaleOption(std::string_view text, ResultRow& row)
 {
     row.point.scaleOption = base::parseThousandths(text);
-    return text == "auto" || row.point.scaleOption;
+    return text == "auto" || row.point.scaleOption.value_or(0) > 0;
+}
+
+bool readScale(std::string_view text, ResultRow& row)
+{
+    return readInto(base::parseThousandths(text), row.point.milliScale) && row.point.milliScale > 0;
 }
 
 bool readSeconds(std::string_view text, ResultRow& row)
@@ -119,7 +124,7 @@ const std::vector<Column> allColumns = {
      [](Text field, Row& row) { return readInto(base::parseThousandths(field), row.point.milliDecibels); }},
     {"scale", number,
      [](const Row& row) { return base::thousandthsText(row.point.milliScale); },
-     [](Text field, Row& row) { return readInto(base::parseThousandths(field), row.point.milliScale); }},
+     readScale},
     {"frames", text,
      [](const Row& row) { return row.frames.text(); },
      [](Text field, Row& row) { return readInto(FrameSet::parse(field), row.frames) && row.frames.size() > 0; }},

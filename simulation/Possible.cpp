@@ -41,7 +41,9 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
     if (errors.bitErrors < errors.blockErrors || errors.bitErrors > errors.blockErrors * K) {
         return cannotBe("bit_errors", errors.bitErrors, wrongBlocks);
     }
-    if (errors.bitErrorSquares < errors.bitErrors || errors.bitErrorSquares / K > errors.bitErrors) {
+    // A square is odd where its number is, and so are the sums.
+    if (errors.bitErrorSquares < errors.bitErrors || errors.bitErrorSquares / K > errors.bitErrors ||
+        errors.bitErrorSquares % 2 != errors.bitErrors % 2) {
         return cannotBe("bit_error_squares", errors.bitErrorSquares, std::to_string(errors.bitErrors) + " wrong bits");
     }
     if (clipped > std::uint64_t{3} * (K + 4) * blocks) {

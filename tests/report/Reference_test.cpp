@@ -95,9 +95,9 @@ TEST_F(Reference, ReadsResultsOfARun)
     const auto curves = read(
         "point,block_size,num_pu,algorithm,scale_option,iterations,ebn0_db,scale,frames,blocks,bit_errors,block_errors,"
         "ber,ber_low,ber_high,bler,bler_low,bler_high,clipped_fraction,failed_frames,seconds\n"
-        "0,512,8,scaled,auto,6,1,8.5,0-999,1000,600,20,1.2e-3,1.0e-3,1.4e-3,2.0e-2,1.2e-2,3.1e-2,4.5e-4,3 17,0.1\n"
-        "1,512,8,scaled,auto,6,2,9.5,0-999,1000,0,0,0,0,5.9e-6,0,0,3.0e-3,9e-4,,0.1\n"
-        "2,512,4,table,8,6,1,8,0-999,1000,500,10,1.0e-3,0,0.1,1e-2,0,0.1,4e-4,5,0.1\n");
+        "0,512,8,scaled,auto,6,1,8.5,0:1000,1000,600,20,1.2e-3,1.0e-3,1.4e-3,2.0e-2,1.2e-2,3.1e-2,4.5e-4,3 17,0.1\n"
+        "1,512,8,scaled,auto,6,2,9.5,0:1000,1000,0,0,0,0,5.9e-6,0,0,3.0e-3,9e-4,,0.1\n"
+        "2,512,4,table,8,6,1,8,0:1000,1000,500,10,1.0e-3,0,0.1,1e-2,0,0.1,4e-4,5,0.1\n");
     ASSERT_EQ(curves.size(), 2U);
     EXPECT_EQ(curves[0].title, "rates: K = 512, 8 units, scaled, 6 iterations");
     EXPECT_EQ(curves[1].title, "rates: K = 512, 4 units, table, 6 iterations, scale 8");
@@ -202,6 +202,31 @@ TEST_F(Reference, RefusesValuesThatCannotBe)
     expectRefused(header + "0,,0.3,0.2,,,,\n", bounds);
     expectRefused("ebn0_db,ber" + std::string(999, ',') + '\n', ":1: names 1001 columns, there may be 1000");
     EXPECT_EQ(read(header + "0,0.1,0.1,0.1,10,400,10,40\n0,0.1,,,,401,11,\n").size(), 2U);
+}
+
+TEST_F(Reference, RefusesRunsThatCannotBe)
+{
+    const auto expectNone = [this](const std::string& column, const std::string& field, const std::string& allowed) {
+        expectRefused("ebn0_db,ber,blocks," + column + "\n0,0.1,10," + field + '\n',
+                      ":2: \"" + field + "\" in the column " + column + " is not allowed, allowed are " + allowed);
+    };
+    for (const char* const size : {"41", "0", "6145"}) {
+        expectNone("block_size", size, "the block sizes of 3GPP TS 36.212, 40 to 6144");
+    }
+    for (const char* const units : {"0", "3", "16"}) {
+        expectNone("num_pu", units, "2, 4 and 8");
+    }
+    for (const char* const seconds : {"nan", "-0.1", "inf", "1e13", "soon"}) {
+        expectNone("seconds", seconds, "the numbers from 0 to 1e+12");
+    }
+    for (const char* const seed : {"-1", "1.5", "18446744073709551616"}) {
+        expectNone("seed", seed, "the integers 0 to 18446744073709551615");
+    }
+    for (const char* const frames : {"all", "9:0", "0:9", "0:5 4:9"}) {
+        expectNone("frames", frames, "a number, or ranges FROM:TO of as many frames as there are blocks");
+    }
+    const std::string header = "ebn0_db,ber,blocks,block_size,num_pu,seconds,seed,frames\n";
+    EXPECT_EQ(read(header + "0,0.1,10,40,2,0,1,0:10\n1,0.1,10,40,2,1.5,1,0:4 6:12\n2,0.1,10,,,,,10\n").size(), 2U);
 }
 
 TEST_F(Reference, RefusesValuesThatAreNone)

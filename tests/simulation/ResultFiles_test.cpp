@@ -127,6 +127,12 @@ TEST_F(ResultFiles, WithMistakesAreRefusedWithTheirPlaces)
     EXPECT_EQ(refusal("a.csv", csvWith(",1.25,", ",1.25dB,")), "a.csv:2: ebn0_db \"1.25dB\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",0:40,", ",40:0,")), "a.csv:2: frames \"40:0\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",0:40,", ",,")), "a.csv:2: frames \"\" is not allowed");
+    for (const char* const scale : {"-8.125", "0", "-0.001"}) {
+        const std::string reason = std::string(" \"") + scale + "\" is not allowed";
+        EXPECT_EQ(refusal("a.csv", csvWith(",8.125,", std::string(",") + scale + ',')), "a.csv:2: scale" + reason);
+        EXPECT_EQ(refusal("a.csv", csvWith(",auto,", std::string(",") + scale + ',')),
+                  "a.csv:2: scale_option" + reason);
+    }
     EXPECT_EQ(refusal("a.csv", csvWith(",40,28,", ",41,28,")), "a.csv:2: blocks \"41\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith(",28,", ",-28,")), "a.csv:2: bit_errors \"-28\" is not allowed");
     EXPECT_EQ(refusal("a.csv", csvWith("0 10 20", "0 x 20")), "a.csv:2: failed_frames \"0 x 20 30\" is not allowed");
@@ -169,6 +175,9 @@ TEST_F(ResultFiles, WithImpossibleCountsAreRefused)
     EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,1160,")),
               cannotBe("bit_error_squares 1160 cannot be, of 28 wrong bits"))
         << "more than all bits of as few blocks";
+    EXPECT_EQ(refusal("a.csv", csvWith(",28,4,196,", ",28,4,197,")),
+              cannotBe("bit_error_squares 197 cannot be, of 28 wrong bits"))
+        << "an odd sum of squares of an even sum";
     EXPECT_EQ(refusal("a.csv", csvWith(",120,2.27", ",5281,2.27")),
               cannotBe("clipped_values 5281 cannot be, of 40 blocks of 40 bits"))
         << "40 blocks have 5280 soft values";
