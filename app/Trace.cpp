@@ -117,9 +117,9 @@ std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const rules
     if (options.format == "vcd") {
         return trace::vcdTrace(openOutput(options), cut, options.selection);
     }
-    const vectors::Table table = trace::traceTable(options.selection);
-    auto rows = options.format == "csv" ? vectors::csvWriter(openOutput(options), table)
-                                        : vectors::npyWriter(openOutput(options), table);
+    const tables::Table table = trace::traceTable(options.selection);
+    auto rows = options.format == "csv" ? tables::csvWriter(openOutput(options), table)
+                                        : tables::npyWriter(openOutput(options), table);
     return trace::tableTrace(std::move(rows), options.block, options.selection);
 }
 

@@ -188,7 +188,7 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
 {
     settings.formats = {"memh"};
     const auto append = [](const std::string& text, std::vector<std::string>& formats) {
-        if (vectors::findFormat(text) == nullptr) {
+        if (tables::findFormat(text) == nullptr) {
             refuse("--format", text, "allowed are memh, csv, npy, c");
         }
         formats.push_back(text);

@@ -1,16 +1,15 @@
 // Point: what one error rate is simulated for.
 #include "Point.h"
 
-#include <array>
 #include <tuple>
 
+#include "base/Numbers.h"
 #include "base/Thousandths.h"
+#include "rules/Algorithms.h"
 
 namespace morvik::simulation {
 
 namespace {
-
-constexpr std::array<std::string_view, 3> algorithmNames = {"max-log", "scaled", "table"};
 
 auto curveOf(const Point& point)
 {
@@ -41,17 +40,14 @@ bool onSameCurve(const Point& a, const Point& b)
 
 std::string algorithmName(unsigned algorithm)
 {
-    return std::string(algorithmNames.at(algorithm));
+    return std::string(rules::algorithmNames.at(algorithm));
 }
 
 std::optional<unsigned> algorithmOf(std::string_view nameOrNumber)
 {
-    for (unsigned i = 0; i < algorithmNames.size(); ++i) {
-        if (nameOrNumber == algorithmNames[i] || nameOrNumber == std::to_string(i)) {
-            return i;
-        }
-    }
-    return std::nullopt;
+    const auto named = rules::findAlgorithm(nameOrNumber);
+    const auto number = nameOrNumber.size() == 1 ? base::parseNumber<unsigned>(nameOrNumber) : std::nullopt;
+    return number && *number < rules::algorithmNames.size() ? number : named;
 }
 
 std::string scaleOptionText(const ScaleOption& option)

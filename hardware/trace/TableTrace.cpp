@@ -9,7 +9,7 @@ namespace {
 
 class TableTrace : public TraceWriter {
 public:
-    TableTrace(std::unique_ptr<vectors::TableWriter> table, std::uint32_t block, Selection selection)
+    TableTrace(std::unique_ptr<tables::TableWriter> table, std::uint32_t block, Selection selection)
         : itsTable(std::move(table)), itsBlock(block), itsSelection(std::move(selection))
     {
     }
@@ -42,31 +42,31 @@ public:
     }
 
 private:
-    std::unique_ptr<vectors::TableWriter> itsTable;
+    std::unique_ptr<tables::TableWriter> itsTable;
     std::uint32_t itsBlock;
     Selection itsSelection;
-    vectors::Row itsRow;
+    tables::Row itsRow;
 };
 
 }  // namespace
 
-vectors::Table traceTable(const Selection& selection)
+tables::Table traceTable(const Selection& selection)
 {
-    vectors::Table table = {"trace",
-                            {{"half_iteration", 5, false},
-                             {"code", 2, false},
-                             {"step", 13, false},
-                             {"segment", 5, false},
-                             {"window", 4, false},
-                             {"unit", 3, false},
-                             {"thread", 2, false}}};
+    tables::Table table = {"trace",
+                           {{"half_iteration", 5, false},
+                            {"code", 2, false},
+                            {"step", 13, false},
+                            {"segment", 5, false},
+                            {"window", 4, false},
+                            {"unit", 3, false},
+                            {"thread", 2, false}}};
     for (const unsigned signal : selection.signals) {
         table.columns.push_back({passSignals[signal], passBits, true});
     }
     return table;
 }
 
-std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<vectors::TableWriter> table,
+std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<tables::TableWriter> table,
                                         std::uint32_t block,
                                         const Selection& selection)
 {

@@ -6,8 +6,8 @@
 #include <memory>
 
 #include "Selection.h"
+#include "hardware/tables/Formats.h"
 #include "hardware/testbench/Passes.h"
-#include "hardware/vectors/Formats.h"
 
 namespace morvik::trace {
 
@@ -24,10 +24,10 @@ public:
 };
 
 /// The table that table formats write: half-iteration, place and signals of a trellis step.
-vectors::Table traceTable(const Selection& selection);
+tables::Table traceTable(const Selection& selection);
 
 /// Rows of traceTable, all of them of the block.
-std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<vectors::TableWriter> table,
+std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<tables::TableWriter> table,
                                         std::uint32_t block,
                                         const Selection& selection);
 

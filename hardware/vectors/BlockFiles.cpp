@@ -15,7 +15,7 @@ namespace {
 /// The streams as `morvik decode` names them.
 constexpr std::array<const char*, 3> streamNames = {"rsc1_sys", "rsc1_par", "rsc2_par"};
 
-Table blocksTable()
+tables::Table blocksTable()
 {
     return {"blocks",
             {{"block_size", 13, false},
@@ -26,9 +26,9 @@ Table blocksTable()
              {"first_bit", 32, false}}};
 }
 
-Table internalTable()
+tables::Table internalTable()
 {
-    Table table = {"internal", {{"half_iteration", 5, false}, {"step", 13, false}}};
+    tables::Table table = {"internal", {{"half_iteration", 5, false}, {"step", 13, false}}};
     for (const char* const signal : passSignals) {
         table.columns.push_back({signal, passBits, true});
     }
@@ -36,7 +36,7 @@ Table internalTable()
 }
 
 /// Refuses a row that cannot belong to a set of blocks.
-void checkBlock(const Row& row, std::uint32_t iterations, const std::string& place)
+void checkBlock(const tables::Row& row, std::uint32_t iterations, const std::string& place)
 {
     if (standard::findBlockSize(static_cast<std::uint32_t>(row[0])) == nullptr) {
         throw base::Error(place + ": block_size " + std::to_string(row[0]) + " is none of 3GPP TS 36.212");
@@ -49,12 +49,12 @@ void checkBlock(const Row& row, std::uint32_t iterations, const std::string& pla
 
 }  // namespace
 
-Layout::Layout(const Format& format, const Settings& settings)
+Layout::Layout(const tables::Format& format, const Settings& settings)
     : tables({blocksTable()}), streamsAreSeparate(settings.separateStreams && format.name == "memh")
 {
-    Table together = {"stimulus", {}};
+    tables::Table together = {"stimulus", {}};
     for (const char* const name : streamNames) {
-        const Column column = {name, settings.width, true};
+        const tables::Column column = {name, settings.width, true};
         together.columns.push_back(column);
         if (streamsAreSeparate) {
             tables.push_back({"stimulus_" + std::string(name), {column}});
@@ -63,7 +63,7 @@ Layout::Layout(const Format& format, const Settings& settings)
     if (!streamsAreSeparate) {
         tables.push_back(together);
     }
-    const auto add = [this](const Table& table) {
+    const auto add = [this](const tables::Table& table) {
         tables.push_back(table);
         return tables.size() - 1;
     };
@@ -80,8 +80,8 @@ std::set<std::string> filesOfAllTables()
     settings.internal = true;
     for (const bool separate : {false, true}) {
         settings.separateStreams = separate;
-        for (const Format& format : formats()) {
-            for (const Table& table : Layout(format, settings).tables) {
+        for (const tables::Format& format : tables::formats()) {
+            for (const tables::Table& table : Layout(format, settings).tables) {
                 const std::vector<std::string> files = format.files(table);
                 names.insert(files.begin(), files.end());
             }
@@ -90,10 +90,10 @@ std::set<std::string> filesOfAllTables()
     return names;
 }
 
-BlockWriter::BlockWriter(const std::string& folder, const Format& format, const Settings& settings)
+BlockWriter::BlockWriter(const std::string& folder, const tables::Format& format, const Settings& settings)
     : itsLayout(format, settings), itsIterations(settings.iterations), itsRows(itsLayout.tables.size())
 {
-    for (const Table& table : itsLayout.tables) {
+    for (const tables::Table& table : itsLayout.tables) {
         itsWriters.push_back(format.writer(folder, table));
     }
 }
@@ -118,7 +118,7 @@ void BlockWriter::add(const Stimulus& stimulus, const Expected& expected)
         addRow(itsLayout.ratios, {ratio});
     }
     for (const InternalStep& step : expected.internal) {
-        Row row = {step.halfIteration, step.step};
+        tables::Row row = {step.halfIteration, step.step};
         row.insert(row.end(), step.values.begin(), step.values.end());
         addRow(itsLayout.internal, row);
     }
@@ -128,7 +128,7 @@ void BlockWriter::add(const Stimulus& stimulus, const Expected& expected)
 void BlockWriter::addStimulus(const Stimulus& stimulus)
 {
     for (std::size_t position = 0; position < stimulus.streams[0].size(); ++position) {
-        Row row;
+        tables::Row row;
         for (std::size_t stream = 0; stream < stimulus.streams.size(); ++stream) {
             row.push_back(stimulus.streams[stream][position]);
             if (itsLayout.streamsAreSeparate) {
@@ -157,16 +157,16 @@ std::vector<KeptTable> BlockWriter::tables() const
     return kept;
 }
 
-void BlockWriter::addRow(std::size_t table, const Row& row)
+void BlockWriter::addRow(std::size_t table, const tables::Row& row)
 {
     itsWriters[table]->add(itsBlock, row);
     ++itsRows[table];
 }
 
-BlockReader::BlockReader(const std::string& folder, const Format& format, const Settings& settings)
+BlockReader::BlockReader(const std::string& folder, const tables::Format& format, const Settings& settings)
     : itsLayout(format, settings), itsIterations(settings.iterations), itsRows(itsLayout.tables.size())
 {
-    for (const Table& table : itsLayout.tables) {
+    for (const tables::Table& table : itsLayout.tables) {
         itsReaders.push_back(format.reader(folder, table));
     }
 }
@@ -197,7 +197,7 @@ bool BlockReader::next(Stimulus& stimulus, Expected& expected)
 /// Goes to the next row of a table, which has to belong to the block.
 bool BlockReader::nextRow(std::size_t table)
 {
-    const TableReader& reader = *itsReaders[table];
+    const tables::TableReader& reader = *itsReaders[table];
     if (!itsReaders[table]->next(itsRow)) {
         return false;
     }
@@ -229,13 +229,13 @@ void BlockReader::readRow(std::size_t table)
 void BlockReader::readStimulus(Stimulus& stimulus)
 {
     for (std::size_t position = 0; position < stimulus.K + rules::tailPositions; ++position) {
-        Row values;
+        tables::Row values;
         for (std::size_t table = itsLayout.stimulus; table < itsLayout.expected; ++table) {
             readRow(table);
             values.insert(values.end(), itsRow.begin(), itsRow.end());
         }
         for (std::size_t stream = 0; stream < values.size(); ++stream) {
-            checkFits(values[stream], {streamNames[stream], 8, true}, itsReaders[itsLayout.stimulus]->place());
+            tables::checkFits(values[stream], {streamNames[stream], 8, true}, itsReaders[itsLayout.stimulus]->place());
             stimulus.streams[stream].push_back(static_cast<std::int8_t>(values[stream]));
         }
     }

@@ -15,22 +15,22 @@
 #include <vector>
 
 #include "Block.h"
-#include "Formats.h"
 #include "Settings.h"
+#include "hardware/tables/Formats.h"
 
 namespace morvik::vectors {
 
 /// A table as it is kept in a format, and how many rows it has.
 struct KeptTable {
-    Table table;
+    tables::Table table;
     std::uint64_t rows = 0;
 };
 
 /// The tables of a set and where they are among all of them.
 struct Layout {
-    Layout(const Format& format, const Settings& settings);
+    Layout(const tables::Format& format, const Settings& settings);
 
-    std::vector<Table> tables;
+    std::vector<tables::Table> tables;
     bool streamsAreSeparate;  ///< the stimulus is three tables, one for each stream
     std::size_t blocks = 0;
     std::size_t stimulus = 1;  ///< the first of them
@@ -45,7 +45,7 @@ std::set<std::string> filesOfAllTables();
 /// Writes blocks one after the other.
 class BlockWriter {
 public:
-    BlockWriter(const std::string& folder, const Format& format, const Settings& settings);
+    BlockWriter(const std::string& folder, const tables::Format& format, const Settings& settings);
 
     void add(const Stimulus& stimulus, const Expected& expected);
     void finish();
@@ -54,12 +54,12 @@ public:
     std::vector<KeptTable> tables() const;
 
 private:
-    void addRow(std::size_t table, const Row& row);
+    void addRow(std::size_t table, const tables::Row& row);
     void addStimulus(const Stimulus& stimulus);
 
     Layout itsLayout;
     std::uint32_t itsIterations;
-    std::vector<std::unique_ptr<TableWriter>> itsWriters;
+    std::vector<std::unique_ptr<tables::TableWriter>> itsWriters;
     std::vector<std::uint64_t> itsRows;
     std::uint32_t itsBlock = 0;
 };
@@ -67,7 +67,7 @@ private:
 /// Reads them again. What is wrong is thrown as a base::Error that opens with the place.
 class BlockReader {
 public:
-    BlockReader(const std::string& folder, const Format& format, const Settings& settings);
+    BlockReader(const std::string& folder, const tables::Format& format, const Settings& settings);
 
     /// Goes to the next block; false at the end, where no table may have rows left. Names are not in the tables.
     bool next(Stimulus& stimulus, Expected& expected);
@@ -89,10 +89,10 @@ private:
 
     Layout itsLayout;
     std::uint32_t itsIterations;
-    std::vector<std::unique_ptr<TableReader>> itsReaders;
+    std::vector<std::unique_ptr<tables::TableReader>> itsReaders;
     std::vector<std::uint64_t> itsRows;
     std::int64_t itsBlock = -1;
-    Row itsRow;
+    tables::Row itsRow;
 };
 
 }  // namespace morvik::vectors

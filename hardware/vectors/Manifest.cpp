@@ -9,8 +9,8 @@
 #include "base/Shown.h"
 #include "base/TextFile.h"
 #include "base/Thousandths.h"
+#include "rules/Algorithms.h"
 #include "rules/BlockSizes.h"
-#include "simulation/Point.h"
 
 namespace morvik::vectors {
 
@@ -22,7 +22,7 @@ Json parametersOf(const Settings& settings)
 {
     Json json;
     json["num_pu"] = settings.generics.C_NUM_PU;
-    json["algorithm"] = simulation::algorithmName(static_cast<unsigned>(settings.generics.C_ALGORITHM_TYPE));
+    json["algorithm"] = rules::algorithmNames.at(static_cast<std::size_t>(settings.generics.C_ALGORITHM_TYPE));
     json["tag_width"] = settings.generics.C_TAG_WIDTH;
     json["iterations"] = settings.iterations;
     json["block_sizes"] = settings.blockSizes;
@@ -40,7 +40,7 @@ Json parametersOf(const Settings& settings)
 Json tableOf(const KeptTable& kept)
 {
     Json columns = Json::array();
-    for (const Column& column : kept.table.columns) {
+    for (const tables::Column& column : kept.table.columns) {
         columns.push_back({{"name", column.name}, {"bits", column.bits}, {"signed", column.isSigned}});
     }
     return {{"name", kept.table.name}, {"rows", kept.rows}, {"columns", columns}};
@@ -95,7 +95,7 @@ Settings settingsOf(const base::JsonMembers& json)
 {
     Settings settings;
     settings.generics.C_NUM_PU = static_cast<std::int32_t>(json.integer("num_pu", 2, 8));
-    const auto algorithm = simulation::algorithmOf(json.text("algorithm"));
+    const auto algorithm = rules::findAlgorithm(json.text("algorithm"));
     if (!algorithm) {
         json.refuse("algorithm", "allowed are max-log, scaled, table");
     }
@@ -118,10 +118,12 @@ Settings settingsOf(const base::JsonMembers& json)
 }
 
 /// The tables of a format, which have to be those that it writes, but for their rows.
-std::vector<KeptTable> tablesFrom(const base::Json& list, const std::string& place, const std::vector<Table>& tables)
+std::vector<KeptTable> tablesFrom(const base::Json& list,
+                                  const std::string& place,
+                                  const std::vector<tables::Table>& tables)
 {
     std::vector<KeptTable> found;
-    for (const Table& table : tables) {
+    for (const tables::Table& table : tables) {
         const std::size_t i = found.size();
         const bool isThere = i < list.size();
         const std::uint64_t rows =
@@ -143,7 +145,7 @@ ManifestFormat formatFrom(const base::Json& value, const Settings& settings, con
     const base::JsonMembers json(value, fileName + ": format");
     ManifestFormat found;
     found.name = json.text("name");
-    const Format* const format = findFormat(found.name);
+    const tables::Format* const format = tables::findFormat(found.name);
     if (format == nullptr) {
         throw base::Error(fileName + ": format " + base::shown(found.name) + " is not known");
     }
@@ -152,9 +154,9 @@ ManifestFormat formatFrom(const base::Json& value, const Settings& settings, con
         const base::JsonMembers file(each, fileName + ": file of format " + found.name);
         found.files.push_back({file.text("name"), file.text("sha256")});
     }
-    const std::vector<Table> tables = Layout(*format, settings).tables;
+    const std::vector<tables::Table> tables = Layout(*format, settings).tables;
     std::vector<std::string> names;
-    for (const Table& table : tables) {
+    for (const tables::Table& table : tables) {
         const std::vector<std::string> ofTable = format->files(table);
         names.insert(names.end(), ofTable.begin(), ofTable.end());
     }

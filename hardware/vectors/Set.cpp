@@ -172,7 +172,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
         }
     }
     Core core(manifest.settings);
-    BlockReader reader(folder, *findFormat(format.name), manifest.settings);
+    BlockReader reader(folder, *tables::findFormat(format.name), manifest.settings);
     Stimulus stimulus;
     Expected expected;
     std::size_t number = 0;
@@ -204,7 +204,7 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
     SetFolder set(folder);
     std::vector<BlockWriter> writers;
     for (const std::string& name : manifest.settings.formats) {
-        writers.emplace_back(set.aside(), *findFormat(name), manifest.settings);
+        writers.emplace_back(set.aside(), *tables::findFormat(name), manifest.settings);
     }
     Core core(manifest.settings);
     forEachStimulus(manifest.settings, [&](const Stimulus& stimulus) {
@@ -218,7 +218,7 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
         writers[i].finish();
         ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
         for (const KeptTable& kept : format.tables) {
-            for (const std::string& name : findFormat(format.name)->files(kept.table)) {
+            for (const std::string& name : tables::findFormat(format.name)->files(kept.table)) {
                 format.files.push_back({name, sha256(pathOf(set.aside(), name))});
             }
         }

@@ -196,9 +196,9 @@ TEST_F(CommandTrace, ArrayHasTheValuesOfTheTable)
         }
     }
     const auto reader =
-        morvik::vectors::findFormat("npy")->reader(morvik.directory(), morvik::trace::traceTable(selection));
+        morvik::tables::findFormat("npy")->reader(morvik.directory(), morvik::trace::traceTable(selection));
     std::size_t line = 1;
-    for (morvik::vectors::Row row; reader->next(row); ++line) {
+    for (morvik::tables::Row row; reader->next(row); ++line) {
         EXPECT_EQ(row, numbersOf(lines.at(line)));
     }
     EXPECT_EQ(line, lines.size());

@@ -42,10 +42,11 @@ Settings takeSettings(FuzzInput& input)
 /// The files of a format, in their order, are the parts of the input.
 void readBlocks(FuzzInput& input)
 {
-    const Format& format = formats()[input.below(static_cast<unsigned>(formats().size()))];
+    const morvik::tables::Format& format =
+        morvik::tables::formats()[input.below(static_cast<unsigned>(morvik::tables::formats().size()))];
     const Settings settings = takeSettings(input);
     TemporaryFiles files;
-    for (const Table& table : Layout(format, settings).tables) {
+    for (const morvik::tables::Table& table : Layout(format, settings).tables) {
         files.write(format.files(table).front(), input.part());
     }
     try {

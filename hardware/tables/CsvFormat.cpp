@@ -8,7 +8,7 @@
 #include "base/Numbers.h"
 #include "base/Shown.h"
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 namespace {
 
@@ -126,4 +126,4 @@ const Format csvFormat = {"csv",
                               return std::make_unique<CsvReader>(folder, table);
                           }};
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables

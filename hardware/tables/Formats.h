@@ -1,11 +1,11 @@
 // Formats: how each of them writes and reads a table.
-#ifndef MORVIK_HARDWARE_VECTORS_FORMATS_H
-#define MORVIK_HARDWARE_VECTORS_FORMATS_H
+#ifndef MORVIK_HARDWARE_TABLES_FORMATS_H
+#define MORVIK_HARDWARE_TABLES_FORMATS_H
 
 #include "Table.h"
 #include "base/OutputFile.h"
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 /// Words for $readmemh.
 extern const Format memhFormat;
@@ -37,6 +37,6 @@ void checkFits(std::int64_t value, const Column& column, const std::string& plac
 /// So for each value of the row that the reader has come to.
 void checkFits(const Row& row, const Table& table, const TableReader& reader);
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables
 
 #endif

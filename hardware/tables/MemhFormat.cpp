@@ -7,7 +7,7 @@
 #include "base/Numbers.h"
 #include "base/Shown.h"
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 namespace {
 
@@ -137,4 +137,4 @@ const Format memhFormat = {"memh",
                                return std::make_unique<MemhReader>(folder, table);
                            }};
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables

@@ -9,7 +9,7 @@
 #include "base/Numbers.h"
 #include "base/Shown.h"
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 namespace {
 
@@ -170,4 +170,4 @@ const Format cFormat = {"c",
                             return std::make_unique<CReader>(folder, table);
                         }};
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables

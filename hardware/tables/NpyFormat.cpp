@@ -8,7 +8,7 @@
 #include "base/InputFile.h"
 #include "base/Numbers.h"
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 namespace {
 
@@ -152,4 +152,4 @@ const Format npyFormat = {"npy",
                               return std::make_unique<NpyReader>(folder, table);
                           }};
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables

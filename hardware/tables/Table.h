@@ -1,6 +1,6 @@
 // Table: rows of integers in named columns, which every format writes and reads.
-#ifndef MORVIK_HARDWARE_VECTORS_TABLE_H
-#define MORVIK_HARDWARE_VECTORS_TABLE_H
+#ifndef MORVIK_HARDWARE_TABLES_TABLE_H
+#define MORVIK_HARDWARE_TABLES_TABLE_H
 
 #include <cstdint>
 #include <memory>
@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 /// Values of 1 to 32 bits; those with a sign are in two's complement.
 struct Column {
@@ -71,6 +71,6 @@ const std::vector<Format>& formats();
 /// The format of the name, or null.
 const Format* findFormat(const std::string& name);
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables
 
 #endif

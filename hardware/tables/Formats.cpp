@@ -3,7 +3,7 @@
 
 #include "base/Error.h"
 
-namespace morvik::vectors {
+namespace morvik::tables {
 
 const std::vector<Format>& formats()
 {
@@ -55,4 +55,4 @@ void checkFits(const Row& row, const Table& table, const TableReader& reader)
     }
 }
 
-}  // namespace morvik::vectors
+}  // namespace morvik::tables

@@ -1,4 +1,4 @@
-// The formats of vectors: what they write, that they read it again, and what they refuse.
+// The formats of tables: what they write, that they read it again, and what they refuse.
 #include <gtest/gtest.h>
 
 #include <cstdint>
@@ -6,18 +6,18 @@
 #include <vector>
 
 #include "base/Error.h"
-#include "hardware/vectors/Formats.h"
+#include "hardware/tables/Formats.h"
 #include "support/TemporaryFolder.h"
 
 namespace {
 
-using morvik::vectors::Column;
-using morvik::vectors::findFormat;
-using morvik::vectors::Format;
-using morvik::vectors::formats;
-using morvik::vectors::Row;
-using morvik::vectors::storageOf;
-using morvik::vectors::Table;
+using morvik::tables::Column;
+using morvik::tables::findFormat;
+using morvik::tables::Format;
+using morvik::tables::formats;
+using morvik::tables::Row;
+using morvik::tables::storageOf;
+using morvik::tables::Table;
 
 const Table pairs = {"pairs", {{"left", 8, true}, {"right", 4, false}}};
 const Table bits = {"bits", {{"bit", 1, false}}};
@@ -68,7 +68,7 @@ void expectRefused(const std::string& format,
     }
 }
 
-TEST(VectorFormats, ReadWhatTheyWrite)
+TEST(TableFormats, ReadWhatTheyWrite)
 {
     const std::vector<Table> tables = {
         pairs,
@@ -98,7 +98,7 @@ TEST(VectorFormats, ReadWhatTheyWrite)
     }
 }
 
-TEST(VectorFormats, StoreInTheSmallestIntegers)
+TEST(TableFormats, StoreInTheSmallestIntegers)
 {
     EXPECT_EQ(storageOf(pairs).bits, 8U);
     EXPECT_TRUE(storageOf(pairs).isSigned);
@@ -111,7 +111,7 @@ TEST(VectorFormats, StoreInTheSmallestIntegers)
 
 // ---- What they write
 
-TEST(VectorFormats, MemhPutsTheFirstColumnIntoTheLowestDigits)
+TEST(TableFormats, MemhPutsTheFirstColumnIntoTheLowestDigits)
 {
     EXPECT_EQ(written("memh", pairs, {{-128, 15}, {127, 1}, {-1, 0}}, "pairs.memh"),
               "// pairs: hexadecimal digits of a word, from the left: right 1, left 2\n"
@@ -120,13 +120,13 @@ TEST(VectorFormats, MemhPutsTheFirstColumnIntoTheLowestDigits)
               "// bits: hexadecimal digits of a word, from the left: bit 1\n1\n0\n");
 }
 
-TEST(VectorFormats, CsvOpensWithTheBlock)
+TEST(TableFormats, CsvOpensWithTheBlock)
 {
     EXPECT_EQ(written("csv", pairs, {{-128, 15}, {127, 1}, {-1, 0}}, "pairs.csv"),
               "block,left,right\n0,-128,15\n0,127,1\n1,-1,0\n");
 }
 
-TEST(VectorFormats, CHasASourceAndAHeader)
+TEST(TableFormats, CHasASourceAndAHeader)
 {
     EXPECT_EQ(written("c", pairs, {{-128, 15}, {127, 1}}, "pairs.c"),
               "#include \"pairs.h\"\n\nconst int8_t morvik_pairs[MORVIK_PAIRS_ROWS][2] = {\n"
@@ -139,7 +139,7 @@ TEST(VectorFormats, CHasASourceAndAHeader)
               "#include \"bits.h\"\n\nconst uint8_t morvik_bits[MORVIK_BITS_ROWS] = {\n    1U,\n    0U,\n};\n");
 }
 
-TEST(VectorFormats, NpyIsOfVersionOne)
+TEST(TableFormats, NpyIsOfVersionOne)
 {
     const std::string wide = written("npy", {"wide", {{"one", 13, false}, {"two", 12, true}}}, {{258, -2}}, "wide.npy");
     const std::string header = "{'descr': '<i2', 'fortran_order': False, 'shape': (1, 2), }";
@@ -152,7 +152,7 @@ TEST(VectorFormats, NpyIsOfVersionOne)
               "{'descr': '|u1', 'fortran_order': False, 'shape': (3,), }    ");
 }
 
-TEST(VectorFormats, CsvMayHaveAByteOrderMarkAndBlanks)
+TEST(TableFormats, CsvMayHaveAByteOrderMarkAndBlanks)
 {
     const morvik::support::TemporaryFolder folder;
     folder.write("bits.csv",
@@ -163,7 +163,7 @@ TEST(VectorFormats, CsvMayHaveAByteOrderMarkAndBlanks)
 
 // ---- What they refuse
 
-TEST(VectorFormats, MemhNamesThePlace)
+TEST(TableFormats, MemhNamesThePlace)
 {
     expectRefused(
         "memh", "pairs.memh", "// x\n\n17f\n17\n", "pairs.memh:4: word \"17\", expected 3 hexadecimal digits");
@@ -171,7 +171,7 @@ TEST(VectorFormats, MemhNamesThePlace)
     expectRefused("memh", "bits.memh", "0\n2\n", "bits.memh:2: bit 2 is not allowed, allowed are 0 to 1");
 }
 
-TEST(VectorFormats, CsvNamesThePlace)
+TEST(TableFormats, CsvNamesThePlace)
 {
     const std::string header = "block,left,right\n";
     const std::string expected = ", expected 3 decimal integers with commas between them";
@@ -183,7 +183,7 @@ TEST(VectorFormats, CsvNamesThePlace)
         "csv", "pairs.csv", header + "0,128,2\n", "pairs.csv:2: left 128 is not allowed, allowed are -128 to 127");
 }
 
-TEST(VectorFormats, CNamesThePlace)
+TEST(TableFormats, CNamesThePlace)
 {
     const std::string beginning = "const int8_t morvik_pairs[MORVIK_PAIRS_ROWS][2] = {";
     expectRefused("c", "pairs.c", "int x;\n", "pairs.c:1: no line \"" + beginning + '"');
@@ -196,7 +196,7 @@ TEST(VectorFormats, CNamesThePlace)
         "c", "pairs.c", beginning + "\n    {1, 16},\n};\n", "pairs.c:2: right 16 is not allowed, allowed are 0 to 15");
 }
 
-TEST(VectorFormats, NpyNamesThePlace)
+TEST(TableFormats, NpyNamesThePlace)
 {
     const std::string good = written("npy", pairs, {{-128, 15}, {127, 1}}, "pairs.npy");
     expectRefused("npy", "pairs.npy", "", "pairs.npy: is no array of NumPy as it was written");
@@ -211,7 +211,7 @@ TEST(VectorFormats, NpyNamesThePlace)
     expectRefused("npy", "pairs.npy", wrong, "pairs.npy: row 1: right 16 is not allowed, allowed are 0 to 15");
 }
 
-TEST(VectorFormats, ReportAMissingFile)
+TEST(TableFormats, ReportAMissingFile)
 {
     for (const Format& format : formats()) {
         const morvik::support::TemporaryFolder folder;
@@ -225,14 +225,14 @@ TEST(VectorFormats, ReportAMissingFile)
     }
 }
 
-TEST(VectorFormats, ReportAFileThatCannotBeWritten)
+TEST(TableFormats, ReportAFileThatCannotBeWritten)
 {
     for (const Format& format : formats()) {
         EXPECT_THROW(write(format, "/dev/null", pairs, {{1, 1}}), morvik::base::Error) << format.name;
     }
 }
 
-TEST(VectorFormats, KnowNoOtherName)
+TEST(TableFormats, KnowNoOtherName)
 {
     EXPECT_EQ(findFormat("vhdl"), nullptr);
 }
