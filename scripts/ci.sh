@@ -2,7 +2,7 @@
 # Runs locally what continuous integration runs: all stages, or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew mutate packages starts
+# named: abi-renew mutate packages starts memory-short
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -15,9 +15,9 @@ stage_format() {
 }
 
 stage_lint() {
-    tidy {base,src,lanes,link,simulation,report,testbench,trace,comparison,vectors,validation,app,bindings}/'*.cpp'
+    tidy {base,src,lanes,link,simulation,report,hardware,validation,app,bindings}/'*.cpp'
     cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
-        --suppress=internalAstError -I include -I src -I . base src link simulation report testbench trace comparison vectors validation app
+        --suppress=internalAstError -I include -I src -I . base src link simulation report hardware validation app
 }
 
 # Takes as long as all the rest.
@@ -35,7 +35,7 @@ tidy() {
     # Two units of bench/ need packages that are not installed here, and Octave's own compiler builds its function.
     git ls-files "$@" |
         grep -vxE 'bench/(ItppDecoding|benchmark_main)\.cpp|bindings/octave/morvik_mex\.cpp' |
-        xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
+        xargs -P "$(nproc)" -n 4 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
 }
 
 # The documents' site, warnings as errors. A separate test runs their code blocks.
@@ -87,12 +87,26 @@ library_of() {
 # Address and undefined behaviour sanitizers on all tests; then valgrind, which detects reads of uninitialised memory,
 # on those that decode.
 stage_memory() {
-    scripts/build sanitize
     # Long simulations would take ten minutes here; the other tests of the command run the same code.
-    scripts/run-tests sanitize -E '^(BerRuns|MpiRuns|Diagnosis\.(FindsEachMistakeInEachSize|BlamesNoiseAlone))'
-    scripts/build x86_64
-    local test
-    for test in exact_blocks_test random_blocks_test morvik_v1_0_bitacc_cmodel_test TDecoder3G_test TDecoder3GPU_test; do
+    memory_without '^(BerRuns|MpiRuns|Diagnosis\.(FindsEachMistakeInEachSize|BlamesNoiseAlone))'
+}
+
+# Leaves out the other long tests whose code shorter ones run: statistics over many blocks, self-tests, a dump for each
+# fault, and scripts that check numbers.
+stage_memory-short() {
+    local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance'
+    local long="BerRuns|MpiRuns|Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore"
+    local scripts='example_sweep|core_from_document|default_core'
+    memory_without "^($long|CommandTrace\.NeedsNoMore|DefaultScaleTest\.HalfAnd|($scripts)\$)"
+}
+
+# memory_without REGEX: of the names of tests
+memory_without() {
+    scripts/build sanitize
+    scripts/run-tests sanitize -E "$1"
+    local test tests=(exact_blocks_test random_blocks_test morvik_v1_0_bitacc_cmodel_test TDecoder3G_test TDecoder3GPU_test)
+    scripts/build x86_64 "${tests[@]}"
+    for test in "${tests[@]}"; do
         MORVIK_TEST_BLOCKS=5 valgrind --quiet --error-exitcode=99 --leak-check=full \
             "build/x86_64/tests/$test" --gtest_brief=1
     done
@@ -168,7 +182,7 @@ stage_starts() {
     scripts/build coverage TNumberFormat_test
     build/coverage/tests/TNumberFormat_test --gtest_brief=1
     count_lines src/TNumberFormat.cpp
-    scripts/mutate --only rules/Cut.h:23 --every 10 --anew
+    scripts/mutate --only src/TNumberFormat.cpp --every 100 --anew
     scripts/packages x86_64
     scripts/validate --tables
     scripts/renew-results
@@ -183,7 +197,7 @@ scripts/setup --checks --tests
 [ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads hostile coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads hostile coverage tests abi-renew mutate packages starts" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads hostile coverage tests abi-renew mutate packages starts memory-short" >&2
         exit 2
     fi
     echo "== $stage"

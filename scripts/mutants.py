@@ -2,6 +2,7 @@
 
 import pathlib
 import re
+import sys
 from typing import NamedTuple
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
@@ -188,6 +189,16 @@ def mutations(line):
 
 
 def all_mutants():
+    """In a list. An entry of the tables above that nothing matches any more is an error."""
+    mutants = list(mutants_of_places())
+    for file, reasons in EQUIVALENT.items():
+        for old, new in (pair for _, pairs in reasons for pair in pairs):
+            if not any(mutant.file == file and is_replaced(mutant, old, new) for mutant in mutants):
+                sys.exit(f"mutants.py: EQUIVALENT: {file} has no mutant that makes {new!r} of {old!r}")
+    return mutants
+
+
+def mutants_of_places():
     for name, functions in PLACES.items():
         text = (ROOT / name).read_text()
         lines = text.split("\n")
@@ -198,6 +209,9 @@ def all_mutants():
                 yield Mutant(name, number, lines[number], lines[number][:start] + new + lines[number][end:])
 
 
+def is_replaced(mutant, old, new):
+    return old in mutant.original and mutant.original.replace(old, new) == mutant.changed
+
+
 def equivalent(mutant):
-    return any(mutant.original.replace(old, new) == mutant.changed
-               for _, pairs in EQUIVALENT.get(mutant.file, []) for old, new in pairs if old in mutant.original)
+    return any(is_replaced(mutant, old, new) for _, pairs in EQUIVALENT.get(mutant.file, []) for old, new in pairs)
