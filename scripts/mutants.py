@@ -98,6 +98,9 @@ EQUIVALENT = {
     "src/LanePath.cpp": [
         ("a last block of the same size is dropped again at once", [("K < lastK", "K <= lastK")]),
     ],
+    "src/SimulationCall.cpp": [
+        ("blocks that are taken one by one give the same", [("b == 0 && firstAlone", "b == 0 || firstAlone")]),
+    ],
     "src/ComponentPath.cpp": [
         ("room for more values than there are", [("reserve(3 *", "reserve(4 *")]),
     ],

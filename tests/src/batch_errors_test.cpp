@@ -145,4 +145,5 @@ TEST(BatchErrors, OfRefusedBatchesLeaveTheArrayAlone)
     unknown.count = 0;
     EXPECT_EQ(unknown.countErrors(decoder.state(), 3, sent.bits.data(), errors.data(), 0), 0);
     EXPECT_EQ(batch.countErrors(decoder.state(), 3, sent.bits.data(), errors.data(), 6), 0);
+    EXPECT_EQ(batch.countErrors(decoder.state(), 1, sent.bits.data(), errors.data(), 2), 0);
 }
