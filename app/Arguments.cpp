@@ -68,8 +68,8 @@ CLI::Validator offer(const std::vector<std::string>& words)
 std::vector<std::string> blockSizeWords()
 {
     std::vector<std::string> words;
-    words.reserve(standard::blockSizes.size());
-    for (const auto& size : standard::blockSizes) {
+    words.reserve(rules::blockSizes.size());
+    for (const auto& size : rules::blockSizes) {
         words.push_back(std::to_string(size.K));
     }
     return words;
@@ -96,11 +96,11 @@ void refuse(const std::string& option, const std::string& text, const std::strin
 void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
 {
     const auto K = base::parseNumber<std::uint32_t>(text);
-    const auto& sizes = standard::blockSizes;
+    const auto& sizes = rules::blockSizes;
     if (!K || *K < sizes.front().K || *K > sizes.back().K) {
         refuse("--block-size", text, "allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
     }
-    if (standard::findBlockSize(*K) == nullptr) {
+    if (rules::findBlockSize(*K) == nullptr) {
         std::size_t above = 0;
         while (sizes[above].K < *K) {
             ++above;

@@ -17,6 +17,7 @@
 #include "hardware/diagnosis/Diagnosis.h"
 #include "hardware/diagnosis/DiagnosisText.h"
 #include "rules/BlockSizes.h"
+#include "rules/Tail.h"
 
 namespace morvik {
 
@@ -35,12 +36,12 @@ struct Options {
 void check(const doctor::Case& read, const SoftValueReader& blocks, const ReferenceBits& reference)
 {
     const std::size_t K = read.sent.size();
-    if (standard::findBlockSize(static_cast<std::uint32_t>(K)) == nullptr) {
+    if (rules::findBlockSize(static_cast<std::uint32_t>(K)) == nullptr) {
         reference.fail(std::to_string(K) + " bits, allowed are the block sizes of 3GPP TS 36.212 (40 to 6144)");
     }
     if (read.received.size() < K) {
         blocks.failBlock("block of " + std::to_string(read.received.size()) + " rows for " + std::to_string(K) +
-                         " bits, expected " + std::to_string(K + 4));
+                         " bits, expected " + std::to_string(K + rules::tailPositions));
     }
 }
 

@@ -140,7 +140,7 @@ SoftBlock readBlock(const std::string& file, std::uint32_t number)
         }
     }
     if (block.size() < rules::tailPositions ||
-        standard::findBlockSize(static_cast<std::uint32_t>(block.size() - rules::tailPositions)) == nullptr) {
+        rules::findBlockSize(static_cast<std::uint32_t>(block.size() - rules::tailPositions)) == nullptr) {
         reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
     }
     return block;

@@ -6,6 +6,7 @@
 #include <stdexcept>
 
 #include "TInterleaver.h"
+#include "rules/Tail.h"
 
 namespace morvik::bench {
 
@@ -27,7 +28,7 @@ itpp::ivec lteInterleaver(unsigned K)
 /// last four positions.
 itpp::vec received(const NoisyBlocks& blocks, unsigned block, unsigned K)
 {
-    const unsigned positions = K + 4;
+    const unsigned positions = K + rules::tailPositions;
     itpp::vec values(static_cast<int>(3 * positions));
     for (unsigned i = 0; i < 3 * positions; ++i) {
         values(static_cast<int>(i)) = -blocks.streams[i % 3][block * positions + i / 3];

@@ -5,6 +5,7 @@
 #include <stdexcept>
 
 #include "morvik_v1_0_batch.h"
+#include "rules/Tail.h"
 
 namespace morvik::bench {
 
@@ -45,12 +46,12 @@ public:
 private:
     std::int32_t positions() const
     {
-        return static_cast<std::int32_t>(itsWork.blockSize + 4);
+        return static_cast<std::int32_t>(itsWork.blockSize + rules::tailPositions);
     }
 
     const std::int32_t* stream(unsigned s, unsigned block) const
     {
-        return itsBlocks.streams[s].data() + std::size_t{block} * (itsWork.blockSize + 4);
+        return itsBlocks.streams[s].data() + std::size_t{block} * (itsWork.blockSize + rules::tailPositions);
     }
 
     void runSingle(unsigned block)

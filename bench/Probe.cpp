@@ -7,15 +7,17 @@
 #include "rules/Trellis.h"
 #include "rules/TrellisDecision.h"
 
+namespace rules = morvik::rules;
+
 namespace MORVIK_LANES {
 namespace {
 
-constexpr std::size_t states = trellis::stateCount;
+constexpr std::size_t states = rules::stateCount;
 
 template <unsigned count>
 struct Loop {
     using Value = Steps<count>;
-    using Decision = trellis::DecideMax<Value>;
+    using Decision = rules::DecideMax<Value>;
 
     /// A slot for each step: its eight forward metrics and two branch metrics, each of which serves two pairs of
     /// states, because LTE has no second parity stream. They are adjacent, so that the loads of one step never alias
@@ -27,12 +29,12 @@ struct Loop {
     {
         for (unsigned round = 0; round < rounds; ++round) {
             asm volatile("" ::"r"(slots) : "memory");  // as if other code read and wrote them
-            trellis::Column<Decision> a{};
+            rules::Column<Decision> a{};
             for (std::int16_t* to = slots; to != slots + morvik::bench::Probe::steps * slot; to += slot) {
                 const Value g0 = Value::load(to + states * count);
                 const Value g1 = Value::load(to + (states + 1) * count);
-                trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA { a[state].store(to + state * count); });
-                a = trellis::forwardStep(Decision{}, a, trellis::BranchMetrics<Value>{g0, g1, g1, g0});
+                rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA { a[state].store(to + state * count); });
+                a = rules::forwardStep(Decision{}, a, rules::BranchMetrics<Value>{g0, g1, g1, g0});
             }
         }
         asm volatile("" ::"r"(slots) : "memory");

@@ -10,6 +10,7 @@
 #include "support/Blocks.h"
 
 #include "morvik_v1_0_batch.h"
+#include "rules/Tail.h"
 
 namespace {
 
@@ -51,8 +52,8 @@ public:
                 itsSampler.put({randomKey(seed), itsK, milliDecibels, i},
                                8192 * s,
                                itsStreams[s].block(i),
-                               itsK + 4,
-                               &itsFrames.streams[s][std::size_t{i} * (itsK + 4)],
+                               itsK + morvik::rules::tailPositions,
+                               &itsFrames.streams[s][std::size_t{i} * (itsK + morvik::rules::tailPositions)],
                                itsFrames.clipped[i]);
             }
             if (itsSampler.size() >= 256) {
@@ -77,7 +78,7 @@ public:
                                                 itsFrames.streams[0].data(),
                                                 itsFrames.streams[1].data(),
                                                 itsFrames.streams[2].data(),
-                                                static_cast<std::int32_t>(itsK + 4),
+                                                static_cast<std::int32_t>(itsK + morvik::rules::tailPositions),
                                                 itsCount,
                                                 morvik::bench::iterations,
                                                 nullptr,

@@ -20,19 +20,25 @@
 #ifndef MORVIK_LANES_BOUNDS_H
 #define MORVIK_LANES_BOUNDS_H
 
+#include "rules/Cut.h"
+#include "rules/Formats.h"
+#include "rules/Starts.h"
+
 namespace lanes {
 
-constexpr unsigned longestWindow = 64;
+namespace rules = morvik::rules;
+
+using rules::longestWindow;
 
 /// The branch format's limits.
-constexpr int branchMin = -128;
-constexpr int branchMax = 127;
+constexpr int branchMin = rules::smallestOf(rules::branchBits);
+constexpr int branchMax = rules::largestOf(rules::branchBits);
 
 /// Every state but 0 of a known start column.
-constexpr int unlikely = -1024;
+constexpr int unlikely = rules::knownMetric<int>(1, rules::smallestOf(rules::stateBits));
 
 /// The bits of a metric that a border column keeps.
-constexpr int borderMask = ~7;
+constexpr int borderMask = rules::integerOf(rules::borderMask, rules::stateAlignment);
 
 }  // namespace lanes
 

@@ -76,15 +76,13 @@ struct Shape {
     static void runPasses(const lanes::Workspace& workspace, unsigned from, unsigned to)
     {
         for (unsigned h = from; h < to; ++h) {
-            const unsigned d = morvik::rules::constituentOf(h);
+            const unsigned d = rules::constituentOf(h);
             const lanes::ConstituentRows& other = workspace.constituent[1 - d];
             const std::int16_t* joint = h == 0 ? other.systematic : other.joint;
             if (h + 1 < to) {
-                runPass<RuleOf, count, vectors, abreast, scaled, false>(
-                    workspace, d, joint, morvik::rules::isFirstPass(h));
+                runPass<RuleOf, count, vectors, abreast, scaled, false>(workspace, d, joint, rules::isFirstPass(h));
             } else {
-                runPass<RuleOf, count, vectors, abreast, scaled, true>(
-                    workspace, d, joint, morvik::rules::isFirstPass(h));
+                runPass<RuleOf, count, vectors, abreast, scaled, true>(workspace, d, joint, rules::isFirstPass(h));
             }
         }
     }

@@ -15,7 +15,7 @@ namespace lanes {
 
 namespace {
 
-constexpr unsigned states = trellis::stateCount;
+constexpr unsigned states = rules::stateCount;
 
 /// Hands out arrays from a stretch of memory, or adds up their size when there is none yet. Each begins
 /// on a cache line, at an offset that keeps equal steps of different arrays in different sets of the cache.
@@ -85,7 +85,7 @@ void LaneDecoder::setCut(const Cut& cut)
     }
     std::vector<unsigned> permutation(cut.K());
     std::vector<unsigned> inverse(cut.K());
-    morvik::rules::InterleaverAddress address(*standard::findBlockSize(cut.K()));
+    rules::InterleaverAddress address(*rules::findBlockSize(cut.K()));
     for (unsigned i = 0; i < cut.K(); ++i) {
         permutation[i] = address.next();
         inverse[permutation[i]] = i;
@@ -266,7 +266,7 @@ void LaneDecoder::decode(unsigned from, unsigned to)
         prepareStarts(1);
     }
     itsKernel->decode(itsCurrent->space, itsAlgorithm, from, to);
-    itsLastDecoder = morvik::rules::constituentOf(to - 1);
+    itsLastDecoder = rules::constituentOf(to - 1);
 }
 
 /// Before the first passes the state is known at a block's ends alone (rules 10, 19, 20).
@@ -285,10 +285,13 @@ void LaneDecoder::prepareStarts(unsigned d)
     for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments(); ++block) {
         const unsigned first = order.lane(block, 0);
         const unsigned last = order.lane(block, itsCut.segments() - 1);
-        const std::array<int, 12>& t = itsTails[presentBlock(block)];
-        const unsigned o = 6 * d;
-        const auto metrics =
-            trellis::tailColumn<int>({{t[o], t[o + 2], t[o + 4]}, {t[o + 1], t[o + 3], t[o + 5]}, {0, 0, 0}});
+        const TailValues& values = itsTails[presentBlock(block)];
+        rules::Tail<int> tail{};
+        for (unsigned step = 0; step < rules::tailSteps; ++step) {
+            tail.x[step] = values[rules::tailPlace(d, step, false)];
+            tail.p[step] = values[rules::tailPlace(d, step, true)];
+        }
+        const auto metrics = rules::tailColumn(tail);
         for (unsigned state = 0; state < states; ++state) {
             alpha[state * row + first] = state == 0 ? 0 : unlikely;
             lastBeta[state * row + last] = static_cast<std::int16_t>(metrics[state] & borderMask);

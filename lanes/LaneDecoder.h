@@ -11,13 +11,14 @@
 #include "Kernels.h"
 #include "LaneOrder.h"
 #include "rules/Cut.h"
+#include "rules/Tail.h"
 
 namespace lanes {
 
-using morvik::rules::Cut;
+namespace rules = morvik::rules;
 
-/// Positions of a block that carry its tail, behind K others.
-constexpr unsigned tailPositions = 4;
+using rules::Cut;
+using rules::tailPositions;
 
 /// The caller's three streams of a block, K + 4 values each, at any addresses.
 template <class Input>
@@ -86,6 +87,9 @@ private:
     static constexpr unsigned mostSteps = 768;
     static constexpr unsigned mostLanes = 64;
 
+    /// The values of a block's tail, position by position, three streams.
+    using TailValues = std::array<int, rules::tailValues>;
+
     /// Which block a lane's segment belongs to, and the segment's first position there.
     struct LaneStart {
         unsigned block;
@@ -134,9 +138,9 @@ private:
     std::vector<Work> itsWork;  ///< one for each kernel
     const Kernel* itsKernel = nullptr;
     Work* itsCurrent = nullptr;
-    unsigned itsBlocks = 0;                     ///< that are loaded
-    unsigned itsLastDecoder = 0;                ///< whose pass was the last one
-    std::vector<std::array<int, 12>> itsTails;  ///< of each block: position by position, three streams
+    unsigned itsBlocks = 0;       ///< that are loaded
+    unsigned itsLastDecoder = 0;  ///< whose pass was the last one
+    std::vector<TailValues> itsTails;
 };
 
 }  // namespace lanes

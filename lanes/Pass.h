@@ -21,7 +21,7 @@ namespace MORVIK_LANES {
 /// side in one wider vector, where a vector of `count` lanes would leave a part of the machine idle.
 template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, bool scaled>
 class Pass {
-    static constexpr unsigned states = trellis::stateCount;
+    static constexpr unsigned states = rules::stateCount;
     static constexpr unsigned row = vectors * count;
     static constexpr unsigned wide = abreast * count;
     using Value = Steps<count>;
@@ -31,8 +31,8 @@ class Pass {
     using WideRule = RuleOf<wide>;
     using Decision = typename Rule::Decision;
     using WideDecision = typename WideRule::Decision;
-    using Column = trellis::Column<Decision>;
-    using WideColumn = trellis::Column<WideDecision>;
+    using Column = rules::Column<Decision>;
+    using WideColumn = rules::Column<WideDecision>;
 
     /// The metrics of a slot: eight forward metrics, two branch metrics (the others are their doubles: LTE
     /// has no second parity stream, rule 5) and the joint value.
@@ -219,16 +219,14 @@ private:
         const std::uint32_t* const sources = itsInterleaver.sources + i * Lanes::sources;
         __builtin_prefetch(itsSource + sources[lanes::fetchAhead * Lanes::sources]);
         const Value joint = Lanes::load(itsSource, sources, itsInterleaver.controls + i * Lanes::bytes);
-        StepsBranches<count> g = trellis::branchSums(joint, Value::load(itsParity + i * count), Value{});
-        for (Value& metric : g) {
-            metric = clip(metric, lanes::branchMin, lanes::branchMax);
-        }
-        trellis::forEach<states>([&](auto state)
-                                     MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * wide); });
+        StepsBranches<count> g = rules::branchSums(joint, Value::load(itsParity + i * count), Value{});
+        rules::clipBranches(g, lanes::branchMin, lanes::branchMax);
+        rules::forEach<states>([&](auto state)
+                                   MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * wide); });
         g[0].store(slot + slotBranches);
         g[1].store(slot + slotBranches + wide);
         joint.store(slot + slotJoint);
-        a = trellis::forwardStep(itsRule.decision(), a, g);
+        a = rules::forwardStep(itsRule.decision(), a, g);
     }
 
     template <bool last>
@@ -274,14 +272,14 @@ private:
 
     MORVIK_INLINE void storeStep(const Windows& windows, std::size_t i, WideValue value, std::int16_t* rows) const
     {
-        trellis::forEach<abreast>(
+        rules::forEach<abreast>(
             [&](auto j) MORVIK_INLINE_LAMBDA { part<count, j>(value).store(rows + at(windows, j, i) * count); });
     }
 
     static MORVIK_INLINE Column load(const std::int16_t* column)
     {
         Column m{};
-        trellis::forEach<states>(
+        rules::forEach<states>(
             [&](auto state) MORVIK_INLINE_LAMBDA { m[state] = Decision::metric(Value::load(column + state * row)); });
         return m;
     }
@@ -289,7 +287,7 @@ private:
     MORVIK_INLINE WideColumn loadStart(const Windows& windows) const
     {
         WideColumn m{};
-        trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
+        rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
             const std::int16_t* const metrics = itsRows.betaStart + state * row + windows.v * count;
             const Value first = Value::load(metrics + windows.r[0] * states * row);
             if constexpr (abreast == 1) {
@@ -315,19 +313,19 @@ private:
 
     /// A column with state 0 near 0, by a shift that border columns do not notice (Bounds.h).
     template <class AnyDecision>
-    static MORVIK_INLINE trellis::Column<AnyDecision> broughtBack(trellis::Column<AnyDecision> m)
+    static MORVIK_INLINE rules::Column<AnyDecision> broughtBack(rules::Column<AnyDecision> m)
     {
         const auto level = AnyDecision::stored(m[0]);
         const auto kept = level & level.of(lanes::borderMask);
-        trellis::forEach<states>([&](auto state)
-                                     MORVIK_INLINE_LAMBDA { m[state] = AnyDecision::subtract(m[state], kept); });
+        rules::forEach<states>([&](auto state)
+                                   MORVIK_INLINE_LAMBDA { m[state] = AnyDecision::subtract(m[state], kept); });
         return m;
     }
 
     /// Stores a border column (rule 11).
     static MORVIK_INLINE void storeBorder(const Column& m, std::int16_t* column)
     {
-        trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
+        rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
             (Decision::stored(m[state]) & Value::of(lanes::borderMask)).store(column + state * row);
         });
     }
@@ -337,11 +335,11 @@ private:
     MORVIK_INLINE void storeReached(const Windows& windows, const WideColumn& b) const
     {
         const WideColumn m = broughtBack<WideDecision>(b);
-        trellis::forEach<abreast>([&](auto j) MORVIK_INLINE_LAMBDA {
+        rules::forEach<abreast>([&](auto j) MORVIK_INLINE_LAMBDA {
             const unsigned r = windows.r[j];
             std::int16_t* const column = r == 0 ? itsRows.betaReached : itsRows.betaStart + (r - 1) * states * row;
             Column reached{};
-            trellis::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
+            rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
                 reached[state] = Decision::metric(part<count, j>(WideDecision::stored(m[state])));
             });
             storeBorder(reached, column + windows.v * count);

@@ -10,10 +10,10 @@
 namespace MORVIK_LANES {
 
 template <unsigned count>
-using StepsColumn = std::array<Steps<count>, trellis::stateCount>;
+using StepsColumn = std::array<Steps<count>, rules::stateCount>;
 
 template <unsigned count>
-using StepsBranches = trellis::BranchMetrics<Steps<count>>;
+using StepsBranches = rules::BranchMetrics<Steps<count>>;
 
 /// The eight metrics of a slot, side by side in memory.
 template <unsigned count>
@@ -30,7 +30,7 @@ struct StoredColumn {
 template <unsigned countOfLanes>
 struct Greatest {
     static constexpr unsigned count = countOfLanes;
-    using Decision = trellis::DecideMax<Steps<count>>;
+    using Decision = rules::DecideMax<Steps<count>>;
     static constexpr bool fewRegisters = true;
 
     explicit MORVIK_INLINE Greatest(const std::uint8_t*) {}
@@ -44,12 +44,12 @@ struct Greatest {
     /// comparison, nor on when the branch metric is added: the candidates of the backward recursion serve
     /// once more, pair by pair.
     MORVIK_INLINE Steps<count> stepBack(const StoredColumn<count>& a,
-                                        trellis::Column<Decision>& b,
+                                        rules::Column<Decision>& b,
                                         const StepsBranches<count>& g) const
     {
         Steps<count> one{};
         Steps<count> zero{};
-        b = trellis::backwardStep(decision(), b, g, [&](auto pair, const auto& c) MORVIK_INLINE_LAMBDA {
+        b = rules::backwardStep(decision(), b, g, [&](auto pair, const auto& c) MORVIK_INLINE_LAMBDA {
             const Steps<count> even = a[2 * pair];
             const Steps<count> odd = a[2 * pair + 1];
             const Steps<count> bestOne = max(even + c.one[0], odd + c.one[1]);
@@ -77,7 +77,7 @@ struct Corrections {
 template <unsigned countOfLanes>
 struct Corrected {
     static constexpr unsigned count = countOfLanes;
-    using Decision = trellis::DecideMaxHash<Steps<count>, Corrections<count>>;
+    using Decision = rules::DecideMaxHash<Steps<count>, Corrections<count>>;
     static constexpr bool fewRegisters = false;
     Corrections<count> corrections;
 
@@ -89,17 +89,17 @@ struct Corrected {
     }
 
     MORVIK_INLINE Steps<count> stepBack(const StoredColumn<count>& a,
-                                        trellis::Column<Decision>& b,
+                                        rules::Column<Decision>& b,
                                         const StepsBranches<count>& g) const
     {
         StepsColumn<count> alpha{};
         StepsColumn<count> beta{};
-        trellis::forEach<trellis::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
+        rules::forEach<rules::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
             alpha[state] = a[state];
             beta[state] = Decision::stored(b[state]);
         });
-        b = trellis::backwardStep(decision(), b, g);
-        return trellis::logLikelihoodRatio(decision(), alpha, beta, g);
+        b = rules::backwardStep(decision(), b, g);
+        return rules::logLikelihoodRatio(decision(), alpha, beta, g);
     }
 };
 

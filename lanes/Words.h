@@ -19,6 +19,8 @@
 
 namespace MORVIK_LANES {
 
+namespace rules = morvik::rules;
+
 template <unsigned count>
 struct Raw {
     typedef std::int16_t Signed __attribute__((vector_size(2 * count)));

@@ -9,6 +9,7 @@
 
 #include "Channel.h"
 #include "GaussianNumber.h"
+#include "rules/Tail.h"
 
 namespace morvik::link {
 
@@ -67,7 +68,7 @@ void FrameSource::make(std::uint64_t first, unsigned count, Frames& frames)
 {
     frames.sent.resize(std::size_t{count} * itsK);
     for (auto& stream : frames.streams) {
-        stream.resize(std::size_t{count} * (itsK + 4));
+        stream.resize(std::size_t{count} * (itsK + rules::tailPositions));
     }
     frames.clipped.resize(count);
     for (unsigned done = 0; done < count; done += TurboEncoder::blocksAtOnce) {
@@ -119,8 +120,8 @@ void FrameSource::receiveDiscrete(const FrameRandom& random, unsigned frame, std
         itsSampler.put(random,
                        s * streamStride,
                        itsStreams[s].block(frame),
-                       itsK + 4,
-                       &frames.streams[s][place * (itsK + 4)],
+                       itsK + rules::tailPositions,
+                       &frames.streams[s][place * (itsK + rules::tailPositions)],
                        frames.clipped[place]);
     }
     // As many as fit well into the caches.
@@ -133,8 +134,8 @@ void FrameSource::receiveGaussian(const FrameRandom& random, unsigned frame, std
 {
     for (std::uint32_t s = 0; s < itsStreams.size(); ++s) {
         const std::uint64_t* const bits = itsStreams[s].block(frame);
-        std::int8_t* const values = &frames.streams[s][place * (itsK + 4)];
-        for (unsigned i = 0; i < itsK + 4; ++i) {
+        std::int8_t* const values = &frames.streams[s][place * (itsK + rules::tailPositions)];
+        for (unsigned i = 0; i < itsK + rules::tailPositions; ++i) {
             const double noise = gaussianNumber(random.block(random_index::gaussian + s * streamStride + i));
             const double sent = (bits[i / 64] >> i % 64 & 1) != 0 ? 1 : -1;
             const double rounded = std::round(itsScale * (sent + itsDeviation * noise));

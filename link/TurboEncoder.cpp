@@ -7,17 +7,16 @@
 
 #include "BitMatrix.h"
 #include "rules/Interleaver.h"
+#include "rules/Tail.h"
 
 namespace morvik::link {
 
 namespace {
 
-constexpr unsigned tailPositions = 4;
-
 /// Entry i is the position, in the first encoder's order, of the second encoder's bit i.
 std::vector<std::uint16_t> permutation(unsigned K)
 {
-    const standard::BlockSize* const row = standard::findBlockSize(K);
+    const rules::BlockSize* const row = rules::findBlockSize(K);
     if (row == nullptr) {
         throw std::invalid_argument(std::to_string(K) + " is no block size of the LTE turbo code");
     }
@@ -70,7 +69,7 @@ std::array<std::uint64_t, 6> terminate(ConstituentEncoder& encoder)
 }  // namespace
 
 TurboEncoder::TurboEncoder(unsigned K)
-    : itsK(K), itsWords((K + tailPositions + 63) / 64), itsPermutation(permutation(K))
+    : itsK(K), itsWords((K + rules::tailPositions + 63) / 64), itsPermutation(permutation(K))
 {
     for (Slices& slices : itsSlices) {
         slices.resize(std::size_t{64} * itsWords);

@@ -137,7 +137,7 @@ private:
     unsigned blockSize() const
     {
         const auto K = static_cast<unsigned>(count("block_size", UINT32_MAX));
-        if (!text("block_size").empty() && standard::findBlockSize(K) == nullptr) {
+        if (!text("block_size").empty() && rules::findBlockSize(K) == nullptr) {
             refuse("block_size", "the block sizes of 3GPP TS 36.212, 40 to 6144");
         }
         return K;

@@ -25,7 +25,7 @@
 #define MORVIK_INLINE_CALLS
 #endif
 
-namespace arithmetic {
+namespace morvik::rules {
 
 /// A soft value or metric: a signed 16-bit word, left-aligned in its format (rule 1).
 using Value = std::int16_t;
@@ -86,9 +86,6 @@ constexpr Value maskBits(Value value, Value mask)
     return static_cast<Value>(value & mask);
 }
 
-/// Metrics kept at the borders of segments and windows lose their seven low bits (rule 11).
-constexpr Value borderMask = wrap16(0xFF80);
-
-}  // namespace arithmetic
+}  // namespace morvik::rules
 
 #endif

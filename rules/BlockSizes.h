@@ -7,7 +7,7 @@
 #include <array>
 #include <cstdint>
 
-namespace standard {
+namespace morvik::rules {
 
 struct BlockSize {
     std::uint32_t K;   ///< block size in bits
@@ -60,6 +60,6 @@ inline const BlockSize* findBlockSize(std::uint32_t K)
     return row != blockSizes.end() && row->K == K ? row : nullptr;
 }
 
-}  // namespace standard
+}  // namespace morvik::rules
 
 #endif

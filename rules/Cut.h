@@ -36,18 +36,18 @@ constexpr Number windowBefore(Number number, Number segments, Number windows)
 
 /// A window of the backward recursion, which runs from its last step down to its first.
 struct Window {
-    std::uint32_t row = 0;  ///< which window of its segment, from the segment's start
-    std::uint32_t segment = 0;
-    std::uint32_t first = 0;  ///< trellis step
-    std::uint32_t last = 0;
+    std::uint32_t row;  ///< which window of its segment, from the segment's start
+    std::uint32_t segment;
+    std::uint32_t first;  ///< trellis step
+    std::uint32_t last;
 };
 
 /// Where a trellis step is computed.
 struct StepPlace {
-    std::uint32_t segment = 0;
-    std::uint32_t row = 0;  ///< of its window
-    std::uint32_t unit = 0;
-    std::uint32_t thread = 0;  ///< of the unit
+    std::uint32_t segment;
+    std::uint32_t row;  ///< of its window
+    std::uint32_t unit;
+    std::uint32_t thread;  ///< of the unit
 };
 
 /// A block of K bits, cut for a number of units. Windows are numbered in the order in which the backward recursion
@@ -56,7 +56,7 @@ struct StepPlace {
 class Cut {
 public:
     /// No block.
-    constexpr Cut() = default;
+    constexpr Cut() : Cut(0, 1) {}
 
     constexpr Cut(std::uint32_t K, std::uint32_t units, std::uint32_t threadsOfEach = threadsOfUnit)
         : itsK(K),
@@ -195,10 +195,10 @@ private:
         return {row, segment, start + windowStart(row), start + windowStart(row + 1) - 1};
     }
 
-    std::uint32_t itsK = 0;
-    std::uint32_t itsUnits = 1;
-    std::uint32_t itsSegments = 1;
-    std::uint32_t itsLength = 0;
+    std::uint32_t itsK;
+    std::uint32_t itsUnits;
+    std::uint32_t itsSegments;
+    std::uint32_t itsLength;
 };
 
 }  // namespace morvik::rules

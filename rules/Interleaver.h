@@ -4,11 +4,9 @@
 
 #include <cstdint>
 
-#include "BlockSizes.h"
+#include "rules/BlockSizes.h"
 
 namespace morvik::rules {
-
-using standard::BlockSize;
 
 /// The addresses Pi(i) = (f1 i + f2 i^2) mod K for i = 0, 1, ... K - 1: position i of the interleaved order is position
 /// Pi(i) of the natural one (rule 15). Pi(i + 1) = Pi(i) + step(i) and step(i + 1) = step(i) + 2 f2, both modulo K: a

@@ -10,10 +10,13 @@ namespace morvik::rules {
 /// steps.
 constexpr unsigned tailSteps = 3;
 
-/// Positions of a block that carry its tail, behind K others: the values of both encoders, three to a position.
+/// Positions of a block that carry its tail, behind K others.
 constexpr unsigned tailPositions = 4;
 
-/// The place of one of the twelve values, 0 to 11: x z x z x z of the first encoder and then of the second (rule 12).
+/// Values of the tail, of both encoders.
+constexpr unsigned tailValues = 3 * tailPositions;
+
+/// The place of one of them, 0 to 11: x z x z x z of the first encoder and then of the second (rule 12).
 /// Place i is in stream i mod 3 of position K + i / 3.
 constexpr unsigned tailPlace(unsigned constituent, unsigned step, bool isParity)
 {

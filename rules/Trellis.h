@@ -18,10 +18,7 @@
 
 #include "rules/Arithmetic.h"
 
-namespace trellis {
-
-using arithmetic::addWrap;
-using arithmetic::subWrap;
+namespace morvik::rules {
 
 constexpr unsigned stateCount = 8;
 
@@ -79,6 +76,15 @@ MORVIK_INLINE constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide
             twiceIntrinsic - parity0 + parity1,
             twiceIntrinsic - parity0 - parity1,
             twiceIntrinsic + parity0 - parity1};
+}
+
+/// Makes branch metrics of the sums: clips them to the branch format's limits. The tail's are not (rules 5 and 12).
+template <class Wide>
+MORVIK_INLINE constexpr void clipBranches(BranchMetrics<Wide>& sums, int lo, int hi)
+{
+    for (Wide& metric : sums) {
+        metric = clip(metric, lo, hi);
+    }
 }
 
 /// Forward: the column after a step, each state decided between its two predecessors, the one on bit 1
@@ -201,6 +207,6 @@ constexpr std::array<Wide, stateCount> tailColumn(const Tail<Wide>& t)
             e2 - f1 - g3};
 }
 
-}  // namespace trellis
+}  // namespace morvik::rules
 
 #endif

@@ -8,12 +8,7 @@
 
 #include "rules/Arithmetic.h"
 
-namespace trellis {
-
-using arithmetic::addWrap;
-using arithmetic::maxWrap;
-using arithmetic::select;
-using arithmetic::subWrap;
+namespace morvik::rules {
 
 /// Decisions that leave nothing pending: a metric is a plain value.
 template <class Value>
@@ -120,6 +115,6 @@ struct DecideMaxHash {
     }
 };
 
-}  // namespace trellis
+}  // namespace morvik::rules
 
 #endif

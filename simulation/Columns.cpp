@@ -35,7 +35,7 @@ bool readNumber(std::string_view text, Number& value)
 
 bool readBlockSize(std::string_view text, ResultRow& row)
 {
-    return readNumber(text, row.point.blockSize) && standard::findBlockSize(row.point.blockSize) != nullptr;
+    return readNumber(text, row.point.blockSize) && rules::findBlockSize(row.point.blockSize) != nullptr;
 }
 
 bool readNumPu(std::string_view text, ResultRow& row)

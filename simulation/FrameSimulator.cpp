@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "base/Thousandths.h"
+#include "rules/Tail.h"
 
 namespace morvik::simulation {
 
@@ -122,15 +123,16 @@ void FrameSimulator::countWrongBits(const Point& point, std::uint32_t count, std
     veltra_ip_morvik_v1_0_batch_outputs outputs = {};
     outputs.dout = itsDecided.data();
     outputs.dout_alloc = itsDecided.size();
-    expectSuccess(veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.get(),
-                                                          itsFrames.streams[0].data(),
-                                                          itsFrames.streams[1].data(),
-                                                          itsFrames.streams[2].data(),
-                                                          static_cast<std::int32_t>(point.blockSize + 4),
-                                                          count,
-                                                          point.iterations,
-                                                          nullptr,
-                                                          &outputs));
+    expectSuccess(
+        veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.get(),
+                                                itsFrames.streams[0].data(),
+                                                itsFrames.streams[1].data(),
+                                                itsFrames.streams[2].data(),
+                                                static_cast<std::int32_t>(point.blockSize + rules::tailPositions),
+                                                count,
+                                                point.iterations,
+                                                nullptr,
+                                                &outputs));
     const std::uint8_t* sent = itsFrames.sent.data();
     const std::uint8_t* decided = itsDecided.data();
     for (std::uint32_t frame = 0; frame < count; ++frame) {
@@ -142,16 +144,17 @@ void FrameSimulator::countWrongBits(const Point& point, std::uint32_t count, std
 
 void FrameSimulator::countWrongBitsOfEachIteration(const Point& point, std::uint32_t count, std::uint32_t* wrongBits)
 {
-    expectSuccess(veltra_ip_morvik_v1_0_batch_count_errors_i8(itsDecoder.get(),
-                                                              itsFrames.streams[0].data(),
-                                                              itsFrames.streams[1].data(),
-                                                              itsFrames.streams[2].data(),
-                                                              static_cast<std::int32_t>(point.blockSize + 4),
-                                                              count,
-                                                              point.iterations,
-                                                              itsFrames.sent.data(),
-                                                              wrongBits,
-                                                              std::size_t{count} * point.iterations));
+    expectSuccess(
+        veltra_ip_morvik_v1_0_batch_count_errors_i8(itsDecoder.get(),
+                                                    itsFrames.streams[0].data(),
+                                                    itsFrames.streams[1].data(),
+                                                    itsFrames.streams[2].data(),
+                                                    static_cast<std::int32_t>(point.blockSize + rules::tailPositions),
+                                                    count,
+                                                    point.iterations,
+                                                    itsFrames.sent.data(),
+                                                    wrongBits,
+                                                    std::size_t{count} * point.iterations));
 }
 
 }  // namespace morvik::simulation

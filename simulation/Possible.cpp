@@ -5,6 +5,8 @@
 #include <functional>
 #include <vector>
 
+#include "rules/Tail.h"
+
 namespace morvik::simulation {
 
 namespace {
@@ -46,7 +48,7 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
         errors.bitErrorSquares % 2 != errors.bitErrors % 2) {
         return cannotBe("bit_error_squares", errors.bitErrorSquares, std::to_string(errors.bitErrors) + " wrong bits");
     }
-    if (clipped > std::uint64_t{3} * (K + 4) * blocks) {
+    if (clipped > std::uint64_t{3} * (K + rules::tailPositions) * blocks) {
         return cannotBe(
             "clipped_values", clipped, std::to_string(blocks) + " blocks of " + std::to_string(K) + " bits");
     }

@@ -1,6 +1,8 @@
 // Results: rows of result files, one for each point, and for each count of iterations that was looked at there.
 #include "Results.h"
 
+#include "rules/Tail.h"
+
 namespace morvik::simulation {
 
 namespace {
@@ -24,7 +26,7 @@ double blockErrorRate(const ResultRow& row)
 
 double clippedFraction(const ResultRow& row)
 {
-    return share(row.clipped, row.frames.size() * 3 * (row.point.blockSize + 4));
+    return share(row.clipped, row.frames.size() * 3 * (row.point.blockSize + rules::tailPositions));
 }
 
 Bounds bitErrorBounds(const ResultRow& row)

@@ -3,22 +3,24 @@
 
 #include <algorithm>
 #include <array>
-#include <cmath>
 #include <istream>
 #include <ostream>
 
 #include "Messages.h"
 #include "TraceTable.h"
 #include "rules/Arithmetic.h"
+#include "rules/Correction.h"
 #include "rules/Trellis.h"
 #include "rules/TrellisDecision.h"
 
+namespace rules = morvik::rules;
+
 namespace {
 
-using arithmetic::Value;
-using arithmetic::wrap16;
-using BranchMetrics = trellis::BranchMetrics<Value>;
-using StateMetrics = std::array<Value, trellis::stateCount>;
+using morvik::rules::Value;
+using morvik::rules::wrap16;
+using BranchMetrics = rules::BranchMetrics<Value>;
+using StateMetrics = std::array<Value, rules::stateCount>;
 
 /// The corrections of an engine's table, called with a decision difference.
 struct Corrections {
@@ -30,9 +32,9 @@ struct Corrections {
     }
 };
 
-using Max = trellis::DecideMax<Value>;
-using MaxStar = trellis::DecideMaxStar<Value, Corrections>;
-using MaxHash = trellis::DecideMaxHash<Value, Corrections>;
+using Max = rules::DecideMax<Value>;
+using MaxStar = rules::DecideMaxStar<Value, Corrections>;
+using MaxHash = rules::DecideMaxHash<Value, Corrections>;
 
 BranchMetrics branchMetrics(const T8& g)
 {
@@ -45,19 +47,19 @@ StateMetrics stateMetrics(const T8& column)
 }
 
 template <class Decision>
-trellis::Column<Decision> load(const Decision& rule, const T8& column)
+rules::Column<Decision> load(const Decision& rule, const T8& column)
 {
-    trellis::Column<Decision> metrics{};
-    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+    rules::Column<Decision> metrics{};
+    for (unsigned state = 0; state < rules::stateCount; ++state) {
         metrics[state] = rule.metric(column[state]);
     }
     return metrics;
 }
 
 template <class Decision>
-void store(const Decision& rule, const trellis::Column<Decision>& metrics, T8& column)
+void store(const Decision& rule, const rules::Column<Decision>& metrics, T8& column)
 {
-    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+    for (unsigned state = 0; state < rules::stateCount; ++state) {
         column[state] = rule.stored(metrics[state]);
     }
 }
@@ -67,7 +69,7 @@ T8* forward(const Decision& rule, unsigned n, const T8* g, T8* a)
 {
     auto metrics = load(rule, *a);
     for (unsigned j = 1; j < n; ++j) {
-        metrics = trellis::forwardStep(rule, metrics, branchMetrics(g[j - 1]));
+        metrics = rules::forwardStep(rule, metrics, branchMetrics(g[j - 1]));
         store(rule, metrics, a[j]);
     }
     return a + n;
@@ -78,7 +80,7 @@ T8* backward(const Decision& rule, unsigned n, const T8* g, T8* b)
 {
     auto metrics = load(rule, *b);
     for (unsigned j = 1; j < n; ++j) {
-        metrics = trellis::backwardStep(rule, metrics, branchMetrics(*g--));
+        metrics = rules::backwardStep(rule, metrics, branchMetrics(*g--));
         store(rule, metrics, *--b);
     }
     return b - 1;
@@ -88,28 +90,9 @@ template <class Decision>
 short* ratios(const Decision& rule, unsigned n, const T8* a, const T8* b, const T8* g, short* out)
 {
     for (unsigned k = 0; k < n; ++k) {
-        out[k] = trellis::logLikelihoodRatio(rule, stateMetrics(a[k]), stateMetrics(b[k]), branchMetrics(g[k]));
+        out[k] = rules::logLikelihoodRatio(rule, stateMetrics(a[k]), stateMetrics(b[k]), branchMetrics(g[k]));
     }
     return out + n;
-}
-
-/// One entry for each signed 16-bit decision difference.
-constexpr std::uint32_t lutSize = 65536;
-
-/// The correction scale * ln(1 + e^-|d|) of one decision difference, rounded half away from zero,
-/// aligned and cut to eight bits; 0 from `range` on. The `ignored` low bits of the magnitude do not
-/// count. The hardware forms the magnitude of a negative difference by inversion, so -1 reads like
-/// 0 (rule 9).
-unsigned char lutEntry(std::int32_t difference, std::uint32_t ignored, long double range, const TNumberFormat& format)
-{
-    const std::int32_t magnitude = difference >= 0 ? difference : ~difference;
-    const std::int32_t kept = magnitude & ~(arithmetic::shiftLeftWrap(1, ignored) - 1);
-    const long double r = static_cast<long double>(arithmetic::shiftRight(kept, format.itsShift)) / format.itsScale;
-    std::int32_t correction = 0;
-    if (r < range) {
-        correction = static_cast<std::int32_t>(std::trunc(format.itsScale * std::log(1.0L + std::exp(-r)) + 0.5L));
-    }
-    return static_cast<unsigned char>(format.place(correction) & 0xFF);
 }
 
 /// Runs the variant of a kernel, "MOD", "MOD*" or "MOD#", that the engine's algorithm type asks for.
@@ -180,12 +163,13 @@ T8* TCalculationEngineModBase::mod_gamma(
     unsigned n, const short* intrinsic, const short* parity0, const short* parity1, T8* g) const
 {
     // The limits are the branch format's integers, aligned like state metrics: -2048 and 2032 (rule 5).
-    const std::int32_t lo = wrap16(arithmetic::shiftLeftWrap(itsBranchFormat->itsMinQ, itsStateFormat->itsShift));
-    const std::int32_t hi = wrap16(arithmetic::shiftLeftWrap(itsBranchFormat->itsMaxQ, itsStateFormat->itsShift));
+    const std::int32_t lo = wrap16(rules::shiftLeftWrap(itsBranchFormat->itsMinQ, itsStateFormat->itsShift));
+    const std::int32_t hi = wrap16(rules::shiftLeftWrap(itsBranchFormat->itsMaxQ, itsStateFormat->itsShift));
     for (unsigned k = 0; k < n; ++k) {
-        const auto sums = trellis::branchSums<std::int32_t>(2 * intrinsic[k], parity0[k], parity1[k]);
-        for (unsigned i = 0; i < sums.size(); ++i) {
-            g[k][i] = wrap16(arithmetic::clip(sums[i], lo, hi));
+        auto metrics = rules::branchSums<std::int32_t>(2 * intrinsic[k], parity0[k], parity1[k]);
+        rules::clipBranches(metrics, lo, hi);
+        for (unsigned i = 0; i < metrics.size(); ++i) {
+            g[k][i] = wrap16(metrics[i]);
         }
     }
     return g + n;
@@ -250,7 +234,7 @@ std::vector<unsigned char> TCalculationEngineModBase::createLUT(unsigned points,
             "8 bit lookup tables");
         return {};
     }
-    const std::uint64_t range = points == 0 ? lutSize : points;
+    const std::uint64_t range = points == 0 ? rules::correctionEntries : points;
     std::uint32_t log2Range = 0;
     while ((std::uint64_t{1} << log2Range) < range) {
         ++log2Range;
@@ -259,13 +243,13 @@ std::vector<unsigned char> TCalculationEngineModBase::createLUT(unsigned points,
         messages::writeError("ERROR:TCalculationEngineModBase::createLUT:Number of points must be a binary number");
         return {};
     }
-    // The table resolves eight points to one at most, and no more fraction bits than the format has.
-    const std::uint32_t resolved = log2Range > 2 ? std::min(stateFormat.itsBinPt, log2Range - 3) : 0;
-    const std::uint32_t ignored = fractionAndShift - resolved;
+    const std::uint32_t ignored = fractionAndShift - rules::resolvedFractionBits(stateFormat.itsBinPt, log2Range);
     std::vector<unsigned char> lut;
-    lut.reserve(lutSize);
+    lut.reserve(rules::correctionEntries);
     for (std::int32_t difference = -32768; difference <= 32767; ++difference) {
-        lut.push_back(lutEntry(difference, ignored, static_cast<long double>(range), stateFormat));
+        const std::int32_t correction = rules::correction(
+            difference, ignored, static_cast<long double>(range), stateFormat.itsShift, stateFormat.itsScale);
+        lut.push_back(static_cast<unsigned char>(stateFormat.place(correction) & 0xFF));  // eight bits
     }
     return lut;
 }

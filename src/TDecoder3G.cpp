@@ -6,10 +6,10 @@
 
 #include "Messages.h"
 #include "TraceTable.h"
-#include "rules/Arithmetic.h"
+#include "rules/SoftValues.h"
+#include "rules/Starts.h"
 
-using arithmetic::shiftRight;
-using arithmetic::wrap16;
+namespace rules = morvik::rules;
 
 namespace {
 
@@ -17,22 +17,6 @@ constexpr const char* tableHeader =
     "n    int           a0          a1          a2          a3          a4          a5          a6          a7"
     "            b0          b1          b2          b3          b4          b5          b6          b7"
     "            g4          g5          g6          g7            llr         ext";
-
-/// The a-priori value halved, brought back to the format's bits, joined with the systematic value
-/// and halved again; both divisions truncate toward zero (rule 13).
-short intrinsicValue(int apriori, int systematic, int stateMask)
-{
-    return wrap16((((apriori / 2) & stateMask) + systematic) / 2);
-}
-
-/// An extrinsic value scaled, clipped and truncated toward zero (rule 14). The hardware's scales, 1 and
-/// 0.75, come out exact, since the value has 19 bits. The product is clipped before it is converted, so
-/// that none leaves the integer's range; one that is not a number becomes the lower limit.
-int scaled(int value, double scale, int lo, int hi)
-{
-    const double product = value * scale;
-    return product > lo ? static_cast<int>(std::min<double>(product, hi)) : lo;
-}
 
 /// One line of the input dump: "label[d]=[" and the values with single blanks between them.
 void dumpStream(std::ostream& out, const char* label, unsigned d, const std::vector<short>& values)
@@ -212,7 +196,7 @@ bool TDecoder3G::startExtrinsic()
     }
     const short mask = itsEngine->itsStateFormat->itsMask;
     std::transform(itsExtrinsicIn.begin(), itsExtrinsicIn.end(), itsExtrinsic.begin(), [mask](short value) {
-        return arithmetic::maskBits(value, mask);
+        return rules::maskBits(value, mask);
     });
     itsExtrinsicIn.clear();
     return true;
@@ -229,7 +213,7 @@ bool TDecoder3G::calcIntrinsic(unsigned int h)
     const int mask = itsEngine->itsStateFormat->itsMask;
     for (unsigned j = 0; j < itsBlockSize; ++j) {
         const int apriori = j < K ? itsExtrinsic[from[j]] : 0;  // nothing is known beforehand of tail bits
-        itsIntrinsic[j] = intrinsicValue(apriori, itsSys[d][j], mask);
+        itsIntrinsic[j] = rules::intrinsicValue(apriori, itsSys[d][j], mask);
     }
     return true;
 }
@@ -261,12 +245,12 @@ bool TDecoder3G::calcExtrinsic(unsigned int)
     const TNumberFormat& state = *itsEngine->itsStateFormat;
     const TNumberFormat& branch = *itsEngine->itsBranchFormat;
     const std::uint32_t spareBits = state.itsNBits - branch.itsNBits;
-    const int lo = shiftRight(branch.itsMin, spareBits);
-    const int hi = shiftRight(branch.itsMax, spareBits);
-    const short mask = itsExtrinsicScale == 1.0 ? wrap16(-1) : state.itsMask;
+    const int lo = rules::shiftRight(branch.itsMin, spareBits);
+    const int hi = rules::shiftRight(branch.itsMax, spareBits);
+    const short mask = rules::extrinsicMask(itsExtrinsicScale, state.itsMask);
     for (unsigned j = 0; j < itsBlockSize; ++j) {
-        const int extrinsic = scaled(itsLLR[j] - 4 * itsIntrinsic[j], itsExtrinsicScale, lo, hi);
-        itsExtrinsic[j] = arithmetic::maskBits(wrap16(extrinsic), mask);
+        const short extrinsic = rules::extrinsicValue(itsLLR[j], itsIntrinsic[j], itsExtrinsicScale, lo, hi);
+        itsExtrinsic[j] = rules::maskBits(extrinsic, mask);
     }
     return true;
 }
@@ -296,22 +280,21 @@ bool TDecoder3G::calcLLR(unsigned int, unsigned int j, unsigned int k)
 
 void TDecoder3G::setInitialState(T8* column) const
 {
-    setUnknownState(column);
-    for (unsigned state = 1; state < 8; ++state) {
-        (*column)[state] = static_cast<short>(itsEngine->itsStateFormat->itsMin / 2);
+    for (unsigned state = 0; state < 8; ++state) {
+        (*column)[state] = rules::knownMetric(state, itsEngine->itsStateFormat->itsMin);
     }
 }
 
 void TDecoder3G::setUnknownState(T8* column)
 {
-    *column = T8{};
+    std::fill_n(column->metric, 8, rules::unknownMetric);
 }
 
 std::vector<unsigned char> TDecoder3G::hardDecisions() const
 {
     std::vector<unsigned char> hard(itsBlockSize - tailSteps);
     for (std::size_t k = 0; k < hard.size(); ++k) {
-        hard[k] = itsLLR[k] >= 0 ? 1 : 0;
+        hard[k] = rules::decision(itsLLR[k]) ? 1 : 0;
     }
     return hard;
 }

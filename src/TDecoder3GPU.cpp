@@ -10,6 +10,7 @@
 #include "rules/Arithmetic.h"
 #include "rules/Cut.h"
 #include "rules/Schedule.h"
+#include "rules/Starts.h"
 #include "rules/Trellis.h"
 
 namespace rules = morvik::rules;
@@ -25,7 +26,7 @@ T8 border(const T8& column)
 {
     T8 kept{};
     for (unsigned state = 0; state < 8; ++state) {
-        kept[state] = arithmetic::maskBits(column[state], arithmetic::borderMask);
+        kept[state] = rules::maskBits(column[state], rules::borderMask);
     }
     return kept;
 }
@@ -286,15 +287,15 @@ bool TDecoder3GPU::preCalcBetaTail(unsigned int h, T8* column) const
 {
     const unsigned d = constituent(h);
     const std::size_t K = itsBlockSize - tailSteps;
-    trellis::Tail<int> tail{};
+    rules::Tail<int> tail{};
     for (unsigned step = 0; step < tailSteps; ++step) {
         tail.x[step] = itsSys[d][K + step];
         tail.p[step] = itsPar0[d][K + step];
         tail.q[step] = itsPar1[d][K + step];
     }
-    const auto metrics = trellis::tailColumn(tail);
+    const auto metrics = rules::tailColumn(tail);
     for (unsigned state = 0; state < 8; ++state) {
-        (*column)[state] = arithmetic::wrap16(metrics[state]);
+        (*column)[state] = rules::wrap16(metrics[state]);
     }
     *column = border(*column);
     return true;

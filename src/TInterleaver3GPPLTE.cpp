@@ -4,6 +4,8 @@
 #include "Messages.h"
 #include "rules/Interleaver.h"
 
+namespace rules = morvik::rules;
+
 TInterleaver* TInterleaver3GPPLTE::create(const std::string& props)
 {
     if (!props.empty()) {
@@ -17,11 +19,11 @@ bool TInterleaver3GPPLTE::calcInterleaver(std::vector<unsigned>& out, unsigned K
 {
     out.clear();
     out.reserve(K);
-    const standard::BlockSize* const params = standard::findBlockSize(K);
+    const rules::BlockSize* const params = rules::findBlockSize(K);
     if (params == nullptr) {
         return false;
     }
-    morvik::rules::InterleaverAddress address(*params);
+    rules::InterleaverAddress address(*params);
     for (unsigned i = 0; i < K; ++i) {
         out.push_back(address.next());
     }
@@ -35,5 +37,5 @@ std::string TInterleaver3GPPLTE::getProperties() const
 
 bool TInterleaver3GPPLTE::valid(unsigned K) const
 {
-    return standard::findBlockSize(K) != nullptr;
+    return rules::findBlockSize(K) != nullptr;
 }

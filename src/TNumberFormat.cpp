@@ -7,19 +7,12 @@
 
 #include "Messages.h"
 #include "Misc.h"
-#include "rules/Arithmetic.h"
+#include "rules/Formats.h"
 
-using arithmetic::shiftLeftWrap;
-using arithmetic::shiftRight;
-using arithmetic::wrap16;
+using morvik::rules::shiftLeftWrap;
+using morvik::rules::wrap16;
 
 namespace {
-
-/// 2^(nbits - 1), modulo 2^32 and with the count modulo 32, so that it is defined for any width.
-std::uint32_t halfRange(std::uint32_t nbits)
-{
-    return std::uint32_t{1} << ((nbits - 1U) & 31U);
-}
 
 TNumberFormat* refuse(const std::string& properties)
 {
@@ -32,12 +25,12 @@ TNumberFormat* refuse(const std::string& properties)
 TNumberFormat::TNumberFormat(std::uint32_t nbits, std::uint32_t binpt)
     : itsNBits(nbits),
       itsBinPt(binpt),
-      itsShift(16U - nbits),
+      itsShift(morvik::rules::alignmentOf(nbits)),
       itsScale(std::uint32_t{1} << (binpt & 31U)),
       itsMin(0),
       itsMax(0),
-      itsMinQ(static_cast<std::int32_t>(0U - halfRange(nbits))),
-      itsMaxQ(static_cast<std::int32_t>(halfRange(nbits) - 1U)),
+      itsMinQ(morvik::rules::smallestOf(nbits)),
+      itsMaxQ(morvik::rules::largestOf(nbits)),
       itsMask(0)
 {
     itsMin = wrap16(shiftLeftWrap(wrap16(itsMinQ), itsShift));
@@ -89,7 +82,7 @@ short TNumberFormat::place(std::int32_t q) const
 
 std::int32_t TNumberFormat::integer(short aligned) const
 {
-    return shiftRight(aligned, itsShift);
+    return morvik::rules::integerOf(aligned, itsShift);
 }
 
 long double TNumberFormat::real(short aligned) const

@@ -8,6 +8,7 @@
 #include "Messages.h"
 #include "PathChoice.h"
 #include "SimulationCall.h"
+#include "rules/SoftValues.h"
 
 namespace {
 
@@ -81,7 +82,7 @@ veltra_ip_morvik_v1_0_state* create_default_state(veltra_ip_morvik_v1_0_generics
     *state = State{};
     state->generics = generics;
     // The shift count has five bits: a width of 32 keeps no bit, as a width of 0.
-    state->tag_mask = (std::uint32_t{1} << (static_cast<std::uint32_t>(generics.C_TAG_WIDTH) & 31U)) - 1U;
+    state->tag_mask = morvik::rules::tagMask(static_cast<std::uint32_t>(generics.C_TAG_WIDTH));
     return state;
 }
 

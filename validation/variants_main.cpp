@@ -19,6 +19,7 @@
 #include "link/GaussianNumber.h"
 #include "link/Random.h"
 #include "link/TurboEncoder.h"
+#include "rules/Tail.h"
 
 namespace {
 
@@ -127,7 +128,7 @@ public:
         }
         itsEncoder.encode(information, 1, itsStreams);
         received.clear();
-        for (unsigned i = 0; i < 3 * (itsK + 4); ++i) {
+        for (unsigned i = 0; i < 3 * (itsK + morvik::rules::tailPositions); ++i) {
             const std::uint64_t bit = itsStreams[i % 3].bits[i / 3 / 64] >> i / 3 % 64 & 1;
             const double noise = gaussianNumber(random.block(random_index::gaussian + i));
             received.push_back((bit != 0 ? 1 : -1) + itsDeviation * noise);

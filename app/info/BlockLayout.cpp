@@ -27,7 +27,7 @@ NumberFormat formatOf(const std::string& what, const std::string& text)
 
 BlockLayout layoutOf(std::uint32_t K)
 {
-    const standard::BlockSize* const size = standard::findBlockSize(K);
+    const rules::BlockSize* const size = rules::findBlockSize(K);
     if (size == nullptr) {
         throw std::invalid_argument(std::to_string(K) + " is no block size of the LTE turbo code");
     }

@@ -92,17 +92,17 @@ std::string textOf(const std::vector<NumberFormat>& formats)
 /// All block sizes, as ranges with steps.
 std::string sizesText()
 {
-    std::string text = std::to_string(standard::blockSizes.size()) + " block sizes (3GPP TS 36.212, Table 5.1.3-3):";
+    std::string text = std::to_string(rules::blockSizes.size()) + " block sizes (3GPP TS 36.212, Table 5.1.3-3):";
     std::size_t first = 0;
-    while (first + 1 < standard::blockSizes.size()) {
-        const std::uint32_t step = standard::blockSizes[first + 1].K - standard::blockSizes[first].K;
+    while (first + 1 < rules::blockSizes.size()) {
+        const std::uint32_t step = rules::blockSizes[first + 1].K - rules::blockSizes[first].K;
         std::size_t last = first + 1;
-        while (last + 1 < standard::blockSizes.size() &&
-               standard::blockSizes[last + 1].K - standard::blockSizes[last].K == step) {
+        while (last + 1 < rules::blockSizes.size() &&
+               rules::blockSizes[last + 1].K - rules::blockSizes[last].K == step) {
             ++last;
         }
-        text += "\n  " + std::to_string(standard::blockSizes[first].K) + " to " +
-                std::to_string(standard::blockSizes[last].K) + " in steps of " + std::to_string(step);
+        text += "\n  " + std::to_string(rules::blockSizes[first].K) + " to " +
+                std::to_string(rules::blockSizes[last].K) + " in steps of " + std::to_string(step);
         first = last;
     }
     return text + '\n';
@@ -188,7 +188,7 @@ std::string generalInformation(const Options& options)
                textOf(numberFormats());
     }
     Json object = {{"default_core", jsonOf(usual)}, {"block_sizes", Json::array()}};
-    for (const standard::BlockSize& size : standard::blockSizes) {
+    for (const rules::BlockSize& size : rules::blockSizes) {
         object["block_sizes"].push_back({{"block_size", size.K}, {"f1", size.f1}, {"f2", size.f2}});
     }
     object["formats"] = jsonOf(numberFormats());
@@ -198,10 +198,9 @@ std::string generalInformation(const Options& options)
 /// The sizes around a K that is none.
 std::string neighbours(std::uint32_t K)
 {
-    const auto* const above = std::find_if(standard::blockSizes.begin(),
-                                           standard::blockSizes.end(),
-                                           [K](const standard::BlockSize& size) { return size.K > K; });
-    if (above == standard::blockSizes.begin() || above == standard::blockSizes.end()) {
+    const auto* const above = std::find_if(
+        rules::blockSizes.begin(), rules::blockSizes.end(), [K](const rules::BlockSize& size) { return size.K > K; });
+    if (above == rules::blockSizes.begin() || above == rules::blockSizes.end()) {
         return "they go from 40 to 6144";
     }
     return "the nearest ones are " + std::to_string((above - 1)->K) + " and " + std::to_string(above->K);
@@ -215,7 +214,7 @@ std::string information(const Options& options)
         }
         return generalInformation(options);
     }
-    if (standard::findBlockSize(*options.K) == nullptr) {
+    if (rules::findBlockSize(*options.K) == nullptr) {
         throw std::invalid_argument(std::to_string(*options.K) +
                                     " is no block size of 3GPP TS 36.212: " + neighbours(*options.K));
     }

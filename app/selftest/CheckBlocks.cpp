@@ -6,6 +6,7 @@
 #include "link/FrameSource.h"
 #include "link/Random.h"
 #include "rules/BlockSizes.h"
+#include "rules/Tail.h"
 
 namespace morvik::selftest {
 
@@ -20,7 +21,7 @@ constexpr int milliDecibels = 400;
 void randomise(CheckBatch& batch, std::uint32_t block)
 {
     const link::RandomKey key = link::randomKey(seed);
-    const std::size_t positions = batch.K + 4;
+    const std::size_t positions = batch.K + rules::tailPositions;
     for (std::size_t stream = 0; stream < 3; ++stream) {
         for (std::size_t i = 0; i < positions; ++i) {
             const link::RandomBlock random = link::randomBlock(key, i / 4, 3 * std::uint64_t{batch.K} + stream);
@@ -56,8 +57,8 @@ std::string hexadecimal(std::uint64_t digest)
 std::vector<CheckBatch> checkBatches()
 {
     std::vector<CheckBatch> batches;
-    batches.reserve(standard::blockSizes.size());
-    for (const standard::BlockSize& size : standard::blockSizes) {
+    batches.reserve(rules::blockSizes.size());
+    for (const rules::BlockSize& size : rules::blockSizes) {
         batches.push_back(batchOf(size.K, static_cast<std::uint32_t>(batches.size())));
     }
     return batches;

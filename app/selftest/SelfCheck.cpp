@@ -10,6 +10,7 @@
 
 #include "hardware/testbench/Decoder.h"
 #include "morvik_v1_0_batch.h"
+#include "rules/Tail.h"
 
 namespace morvik::selftest {
 
@@ -53,7 +54,7 @@ void decodeAs(const State& state, const CheckBatch& batch, Decided& decided, Sim
                                          streams[0].data(),
                                          streams[1].data(),
                                          streams[2].data(),
-                                         static_cast<std::int32_t>(batch.K + 4),
+                                         static_cast<std::int32_t>(batch.K + rules::tailPositions),
                                          batch.blocks,
                                          batch.iterations,
                                          nullptr,

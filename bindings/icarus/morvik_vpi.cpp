@@ -8,6 +8,7 @@
 #include <sv_vpi_user.h>
 #include <vpi_user.h>
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <map>
@@ -17,10 +18,13 @@
 #include <vector>
 
 #include "bindings/simulator/Session.h"
+#include "rules/Tail.h"
 
 namespace {
 
 using morvik::simulator::Session;
+
+constexpr int tailPositions = morvik::rules::tailPositions;
 
 /// A system task or function: its name, and one letter per argument: i an integer, a an array of soft values, d an
 /// array of decisions.
@@ -187,7 +191,7 @@ int decode(const std::vector<vpiHandle>& arguments)
     if (size <= 0) {
         throw Mistake("The size is " + std::to_string(size) + ", but a block of K bits has K + 4 positions");
     }
-    const int firstDecision = firstIndex(arguments[7], size > 4 ? size - 4 : 0);
+    const int firstDecision = firstIndex(arguments[7], std::max(size - tailPositions, 0));
     const int iterations = argument(arguments[5], "The number of iterations");
     const auto tag = static_cast<std::uint32_t>(argument(arguments[6], "The tag"));
     // Last: positions that were put belong to the next block, whatever call decodes it.

@@ -20,10 +20,11 @@
 #include "bindings/Listener.h"
 #include "link/TurboEncoder.h"
 #include "morvik_v1_0_batch.h"
+#include "rules/Tail.h"
 
 namespace {
 
-constexpr std::size_t tailPositions = 4;
+using morvik::rules::tailPositions;
 
 enum Status : std::int32_t { success = 0, argumentRefused = 1, blockRefused = 2, outOfMemory = 99 };
 

@@ -13,7 +13,7 @@ namespace morvik::simulator {
 namespace {
 
 constexpr std::size_t tail = 4;
-constexpr std::size_t mostPositions = standard::blockSizes.back().K + tail;
+constexpr std::size_t mostPositions = rules::blockSizes.back().K + tail;
 
 /// Held while the library's output is captured: its streams are process-wide.
 std::mutex turn;
@@ -22,7 +22,7 @@ std::mutex turn;
 std::string sizeHint(std::size_t positions)
 {
     const std::string count = std::to_string(positions);
-    if (standard::findBlockSize(static_cast<std::uint32_t>(positions)) != nullptr) {
+    if (rules::findBlockSize(static_cast<std::uint32_t>(positions)) != nullptr) {
         return ": " + count + " soft values in each stream, but a block of " + count + " bits has " +
                std::to_string(positions + tail) + ", the tail included";
     }

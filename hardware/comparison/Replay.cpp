@@ -5,6 +5,9 @@
 #include <memory>
 
 #include "Decisions.h"
+#include "rules/Formats.h"
+#include "rules/SoftValues.h"
+#include "rules/Starts.h"
 #include "src/TCalculationEngineModBase.h"
 #include "src/TNumberFormat.h"
 
@@ -12,13 +15,8 @@ namespace morvik::comparison {
 
 namespace {
 
-constexpr int step = 16;  // of the state metrics' format, in aligned words
-constexpr int stepMask = -step;
-constexpr int spareBits = 4;  // below a step
-constexpr int metricBits = 12;
-constexpr int softBits = 8;
-constexpr int branchLowest = -2048;  // the branch format's limits in aligned words
-constexpr int branchHighest = 2032;
+constexpr int eighth = 1 << rules::stateAlignment;  // in aligned words of the state format
+constexpr int eighthMask = -eighth;
 
 std::vector<unsigned char> correctionTable()
 {
@@ -29,37 +27,37 @@ std::vector<unsigned char> correctionTable()
 /// The low bits of a value, sign-extended.
 int cutTo(int value, int bits)
 {
-    const auto above = static_cast<std::uint32_t>(32 - spareBits - bits);
-    return arithmetic::shiftRight(arithmetic::shiftLeftWrap(value, above), above);
+    const auto above = static_cast<std::uint32_t>(32 - int{rules::stateAlignment} - bits);
+    return rules::shiftRight(rules::shiftLeftWrap(value, above), above);
 }
 
 int clippedTo(int value, int bits)
 {
-    const int end = step << (bits - 1);
-    return arithmetic::clip(value, -end, end - step);
+    const int end = eighth << (bits - 1);
+    return rules::clip(value, -end, end - eighth);
 }
 
-/// A branch metric or extrinsic value as eight bits of a step each hold it (rules 5 and 14).
+/// A branch metric or extrinsic value as eight bits of an eighth each hold it (rules 5 and 14).
 int narrowed(int value, Mistake mistake)
 {
     switch (mistake.kind) {
     case Mistake::unclipped:
-        return arithmetic::wrap16(value);
+        return rules::wrap16(value);
     case Mistake::clippedTo:
         return clippedTo(value, mistake.number);
     case Mistake::clippedSymmetric:
-        return arithmetic::clip(value, -branchHighest, branchHighest);
+        return rules::clip(value, -rules::branchLargest, rules::branchLargest);
     case Mistake::wrappedTo:
         return cutTo(value, mistake.number);
     default:
-        return arithmetic::clip(value, branchLowest, branchHighest);
+        return rules::clip(value, rules::branchSmallest, rules::branchLargest);
     }
 }
 
 /// By how many bits words of narrower registers are shifted up, so that they wrap where those do.
 unsigned shiftOf(Mistake mistake)
 {
-    return mistake == Mistake::computedIn ? static_cast<unsigned>(metricBits - mistake.number) : 0;
+    return mistake == Mistake::computedIn ? static_cast<unsigned>(int{rules::stateBits} - mistake.number) : 0;
 }
 
 /// Calls use(rule, value) with the rule of decisions and a value of its kind.
@@ -69,30 +67,30 @@ auto withRule(int algorithm, Mistake mistake, const unsigned char* middle, Use u
     using Word = std::int16_t;
     const Corrections<Word> corrections{middle, shiftOf(mistake)};
     if (algorithm != 2 || mistake == Mistake::uncorrected) {
-        return mistake == Mistake::unwrapped ? use(trellis::DecideMax<Held>(), Held())
-                                             : use(trellis::DecideMax<Word>(), Word());
+        return mistake == Mistake::unwrapped ? use(rules::DecideMax<Held>(), Held())
+                                             : use(rules::DecideMax<Word>(), Word());
     }
     if (mistake == Mistake::correctedAtOnce) {
-        return use(trellis::DecideMaxStar<Word, Corrections<Word>>(corrections), Word());
+        return use(rules::DecideMaxStar<Word, Corrections<Word>>(corrections), Word());
     }
     return mistake == Mistake::unwrapped
-               ? use(trellis::DecideMaxHash<Held, Corrections<Held>>(Corrections<Held>{middle}), Held())
-               : use(trellis::DecideMaxHash<Word, Corrections<Word>>(corrections), Word());
+               ? use(rules::DecideMaxHash<Held, Corrections<Held>>(Corrections<Held>{middle}), Held())
+               : use(rules::DecideMaxHash<Word, Corrections<Word>>(corrections), Word());
 }
 
 template <class Decision, class Value>
-trellis::Column<Decision> nextColumn(const Decision& rule,
-                                     bool isForward,
-                                     const trellis::Column<Decision>& metrics,
-                                     const std::array<Value, 4>& branches)
+rules::Column<Decision> nextColumn(const Decision& rule,
+                                   bool isForward,
+                                   const rules::Column<Decision>& metrics,
+                                   const std::array<Value, 4>& branches)
 {
-    return isForward ? trellis::forwardStep(rule, metrics, branches) : trellis::backwardStep(rule, metrics, branches);
+    return isForward ? rules::forwardStep(rule, metrics, branches) : rules::backwardStep(rule, metrics, branches);
 }
 
 template <class Decision, class Value>
-trellis::Column<Decision> settledColumn(const Decision& rule, const std::array<Value, 8>& values)
+rules::Column<Decision> settledColumn(const Decision& rule, const std::array<Value, 8>& values)
 {
-    trellis::Column<Decision> metrics{};
+    rules::Column<Decision> metrics{};
     for (std::size_t state = 0; state < values.size(); ++state) {
         metrics[state] = rule.metric(values[state]);
     }
@@ -106,7 +104,7 @@ void takePending(Value&, const Value&)
 }
 
 template <class Value>
-void takePending(trellis::PendingMetric<Value>& metric, const trellis::PendingMetric<Value>& from)
+void takePending(rules::PendingMetric<Value>& metric, const rules::PendingMetric<Value>& from)
 {
     metric.pending = from.pending;
 }
@@ -115,7 +113,7 @@ template <class Words>
 Words shifted(Words words, unsigned bits)
 {
     for (auto& word : words) {
-        word = arithmetic::wrap16(arithmetic::shiftLeftWrap(word, bits));
+        word = rules::wrap16(rules::shiftLeftWrap(word, bits));
     }
     return words;
 }
@@ -126,18 +124,18 @@ Metrics registered(Metrics metrics, Mistake mistake)
 {
     if (mistake.kind == Mistake::storedIn || mistake.kind == Mistake::computedIn) {
         for (auto& metric : metrics) {
-            metric = arithmetic::wrap16(cutTo(metric, mistake.number));
+            metric = rules::wrap16(cutTo(metric, mistake.number));
         }
     }
     return metrics;
 }
 
 template <class Words>
-Column inSteps(const Words& words, bool complete)
+Column inEighths(const Words& words, bool complete)
 {
     Column column;
     for (std::size_t i = 0; i < words.size(); ++i) {
-        column.values[i] = static_cast<std::int16_t>(words[i] >> 4);
+        column.values[i] = static_cast<std::int16_t>(rules::shiftRight(words[i], rules::stateAlignment));
     }
     column.complete = complete;
     return column;
@@ -172,7 +170,7 @@ std::int16_t Replay::input(const Place& place, bool& complete) const
 {
     const bool inDump = itsDump.has(place);
     complete = complete && inDump;
-    return arithmetic::wrap16((inDump ? itsDump : itsModel.values).at(place) * step);
+    return rules::wrap16((inDump ? itsDump : itsModel.values).at(place) * eighth);
 }
 
 template <class Aligned>
@@ -216,22 +214,22 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
     }
     const bool unpermuted = mistake == Mistake::systematicUnpermuted && !isTail;
     const int systematic = (unpermuted ? itsModel.codes[1 - d] : code).systematic[trellisStep];
-    const int sum = ((apriori / 2) & stepMask) + systematic;  // rule 13, before the last division
-    return mistake == Mistake::intrinsicWrapped   ? cutTo(sum, softBits)
-           : mistake == Mistake::intrinsicClipped ? clippedTo(sum, softBits)
+    const int sum = rules::twiceIntrinsicValue(apriori, systematic, eighthMask);
+    return mistake == Mistake::intrinsicWrapped   ? cutTo(sum, int{rules::inputBits})
+           : mistake == Mistake::intrinsicClipped ? clippedTo(sum, int{rules::inputBits})
                                                   : sum;
 }
 
 Replay::TwiceIntrinsic Replay::twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const
 {
-    // A dump lacks the bit below a step. Hardware whose intrinsic value has other reasons than the inputs may have
+    // A dump lacks the bit below an eighth. Hardware whose intrinsic value has other reasons than the inputs may have
     // another one there than follows from them: then what is computed with it tells.
     const int kept = input({pass, signalsOf(Stage::intrinsic).first, trellisStep}, complete);
     bool hasInputs = true;
     const int computed = twiceIntrinsicFromInputs(pass, trellisStep, {}, hasInputs);
-    const bool isComputed = ((computed / 2) & stepMask) == kept;
+    const bool isComputed = ((computed / 2) & eighthMask) == kept;
     const int likely = isComputed ? computed : 2 * kept;
-    const int other = likely ^ step;
+    const int other = likely ^ eighth;
     const bool isOther = !givesWhatFollows(pass, trellisStep, likely) && givesWhatFollows(pass, trellisStep, other);
     return {isOther ? other : likely, isComputed && hasInputs};
 }
@@ -254,12 +252,12 @@ Column Replay::fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisSt
     bool complete = true;
     const TwiceIntrinsic twice = twiceIntrinsic(pass, trellisStep, complete);
     const auto likely = compute(twice.value, complete);
-    const Column column = inSteps(likely, complete);
+    const Column column = inEighths(likely, complete);
     if (twice.isSure || isInDump(pass, stage, trellisStep, column)) {
         return column;
     }
-    const auto unlikely = compute(twice.value ^ step, complete);
-    const Column other = inSteps(unlikely, complete);
+    const auto unlikely = compute(twice.value ^ eighth, complete);
+    const Column other = inEighths(unlikely, complete);
     return isInDump(pass, stage, trellisStep, other) ? other : column;
 }
 
@@ -280,7 +278,7 @@ Column Replay::intrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mist
 {
     bool complete = true;
     const int twice = twiceIntrinsicFromInputs(pass, trellisStep, mistake, complete);
-    return inSteps(std::array<int, 1>{twice / 2}, complete);
+    return inEighths(std::array<int, 1>{twice / 2}, complete);
 }
 
 Replay::Branches Replay::branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const
@@ -291,17 +289,17 @@ Replay::Branches Replay::branchMetrics(unsigned pass, unsigned trellisStep, int 
         parity = -parity;
     }
     if (mistake == Mistake::doubledWrapped) {
-        twice = cutTo(twice, softBits);
+        twice = cutTo(twice, int{rules::inputBits});
     } else if (mistake == Mistake::doubledClipped) {
-        twice = clippedTo(twice, softBits);
+        twice = clippedTo(twice, int{rules::inputBits});
     }
     Branches metrics{};
-    auto sums = trellis::branchSums(twice, parity, 0);
+    auto sums = rules::branchSums(twice, parity, 0);
     if (mistake == Mistake::negationWrapped) {
-        sums[1] = sums[2] = twice + cutTo(-parity, softBits);
+        sums[1] = sums[2] = twice + cutTo(-parity, int{rules::inputBits});
     }
     for (std::size_t i = 0; i < sums.size(); ++i) {
-        metrics[i] = arithmetic::wrap16(narrowed(sums[i], mistake));
+        metrics[i] = rules::wrap16(narrowed(sums[i], mistake));
     }
     return metrics;
 }
@@ -357,10 +355,10 @@ template <class Metrics>
 Metrics border(Metrics column, Mistake mistake)
 {
     const std::int16_t mask = mistake == Mistake::borderUnknown ? std::int16_t{0}
-                              : mistake == Mistake::borderMask  ? arithmetic::wrap16(mistake.number * step)
-                                                                : arithmetic::borderMask;
+                              : mistake == Mistake::borderMask  ? rules::wrap16(mistake.number * eighth)
+                                                                : rules::borderMask;
     for (auto& metric : column) {
-        metric = arithmetic::maskBits(metric, mask);
+        metric = rules::maskBits(metric, mask);
     }
     return column;
 }
@@ -393,8 +391,9 @@ Replay::Metrics Replay::forwardStart(unsigned pass, unsigned segment, Mistake mi
 {
     if (segment == 0 && mistake != Mistake::borderUnknown) {
         Metrics known;
-        known.fill(-16384);  // rule 10
-        known[0] = 0;
+        for (unsigned state = 0; state < known.size(); ++state) {
+            known[state] = rules::knownMetric<std::int16_t>(state, INT16_MIN);
+        }
         return known;
     }
     const auto from = borderPass(pass, false, mistake);
@@ -411,17 +410,17 @@ Column Replay::forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistak
     const rules::Cut& cut = itsModel.cut;
     if (cut.startsSegment(trellisStep)) {
         const Metrics start = forwardStart(pass, trellisStep / cut.segmentLength(), mistake, complete);
-        return inSteps(registered(start, mistake), complete);
+        return inEighths(registered(start, mistake), complete);
     }
     const bool hasEarlier = !cut.startsSegment(trellisStep - 1);
     const Metrics next = reached(pass, Stage::forward, trellisStep - 1, hasEarlier, mistake, complete);
-    return inSteps(registered(next, mistake), complete);
+    return inEighths(registered(next, mistake), complete);
 }
 
 Replay::Metrics Replay::tail(unsigned pass, Mistake mistake) const
 {
     const Code& code = itsModel.codes[codeOf(pass)];
-    trellis::Tail<int> steps{};
+    rules::Tail<int> steps{};
     for (unsigned i = 0; i < rules::tailSteps; ++i) {
         steps.x[i] = code.systematic[itsModel.cut.K() + i];
         steps.p[i] = code.parity[itsModel.cut.K() + i];
@@ -433,9 +432,9 @@ Replay::Metrics Replay::tail(unsigned pass, Mistake mistake) const
         }
     }
     Metrics column{};
-    const auto metrics = trellis::tailColumn(steps);
+    const auto metrics = rules::tailColumn(steps);
     for (std::size_t state = 0; state < column.size(); ++state) {
-        column[state] = arithmetic::wrap16(metrics[state]);
+        column[state] = rules::wrap16(metrics[state]);
     }
     return column;
 }
@@ -461,11 +460,11 @@ Column Replay::backwardColumn(unsigned pass, unsigned trellisStep, Mistake mista
     const rules::Window window = itsModel.cut.windowAt(trellisStep);
     if (trellisStep == window.last) {
         const Metrics start = backwardStart(pass, window, mistake, complete);
-        return inSteps(registered(start, mistake), complete);
+        return inEighths(registered(start, mistake), complete);
     }
     const Metrics next =
         reached(pass, Stage::backward, trellisStep + 1, trellisStep + 1 < window.last, mistake, complete);
-    return inSteps(registered(next, mistake), complete);
+    return inEighths(registered(next, mistake), complete);
 }
 
 Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const
@@ -481,16 +480,16 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
         const auto backward = fromWords<Value>(b);
         const auto branches = fromWords<Value>(g);
         if (mistake == Mistake::ratioHeld) {
-            return held(wordOf(trellis::bestPath<1>(rule, forward, backward, branches)) -
-                        wordOf(trellis::bestPath<0>(rule, forward, backward, branches)))
+            return held(wordOf(rules::bestPath<1>(rule, forward, backward, branches)) -
+                        wordOf(rules::bestPath<0>(rule, forward, backward, branches)))
                 .value;
         }
-        return wordOf(trellis::logLikelihoodRatio(rule, forward, backward, branches));
+        return wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
     };
     const std::int16_t word =
         withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, itsCorrections.data() + itsCorrections.size() / 2, ratio);
     const auto unshifted = static_cast<std::int16_t>(word >> shift);
-    return inSteps(registered(std::array<std::int16_t, 1>{unshifted}, mistake), complete);
+    return inEighths(registered(std::array<std::int16_t, 1>{unshifted}, mistake), complete);
 }
 
 int Replay::wideExtrinsicValue(int ratio, int twice, Mistake mistake) const
@@ -501,7 +500,7 @@ int Replay::wideExtrinsicValue(int ratio, int twice, Mistake mistake) const
 
 int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const
 {
-    return narrowed(wideExtrinsicValue(ratio, twice, mistake), mistake) & stepMask;
+    return narrowed(wideExtrinsicValue(ratio, twice, mistake), mistake) & eighthMask;
 }
 
 unsigned Replay::roundingClass(unsigned pass, Stage stage, unsigned trellisStep) const
@@ -511,17 +510,17 @@ unsigned Replay::roundingClass(unsigned pass, Stage stage, unsigned trellisStep)
         const unsigned from = aprioriStep(codeOf(pass), trellisStep, {});
         const int half = input({pass - 1, signalsOf(Stage::extrinsic).first, from}, complete) / 2;
         const int sum = twiceIntrinsicFromInputs(pass, trellisStep, {}, complete);
-        const bool loses = ((half | sum / 2) & ~stepMask) != 0;
+        const bool loses = ((half | sum / 2) & ~eighthMask) != 0;
         return !loses ? 0
-                      : 1U + ((half & ~stepMask) != 0 ? 1U : 0U) + ((sum / 2 & ~stepMask) != 0 ? 2U : 0U) +
+                      : 1U + ((half & ~eighthMask) != 0 ? 1U : 0U) + ((sum / 2 & ~eighthMask) != 0 ? 2U : 0U) +
                             (half < 0 ? 4U : 0U) + (sum < 0 ? 8U : 0U);
     }
     if (stage == Stage::extrinsic) {
         const int ratio = input({pass, signalsOf(Stage::ratio).first, trellisStep}, complete);
         const int value = wideExtrinsicValue(ratio, twiceIntrinsic(pass, trellisStep, complete).value, {});
-        const auto lost = static_cast<unsigned>(value & ~stepMask);
-        const bool isClipped = value < branchLowest || value > branchHighest;
-        return lost == 0 || isClipped ? 0 : lost + (value < 0 ? static_cast<unsigned>(step) : 0U);
+        const auto lost = static_cast<unsigned>(value & ~eighthMask);
+        const bool isClipped = value < rules::branchSmallest || value > rules::branchLargest;
+        return lost == 0 || isClipped ? 0 : lost + (value < 0 ? static_cast<unsigned>(eighth) : 0U);
     }
     return 0;
 }

@@ -60,8 +60,8 @@ struct Place {
 /// Values in steps of the state metrics' format: 12 bits, eighths of 1.
 class Values {
 public:
-    static constexpr std::int16_t smallest = -2048;
-    static constexpr std::int16_t largest = 2047;
+    static constexpr std::int16_t smallest = rules::smallestOf(passBits);
+    static constexpr std::int16_t largest = rules::largestOf(passBits);
     static constexpr std::int16_t missing = INT16_MIN;
     static constexpr std::int16_t unknown = INT16_MIN + 1;  ///< x where there should be a value
 

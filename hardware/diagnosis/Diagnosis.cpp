@@ -6,6 +6,7 @@
 #include <tuple>
 
 #include "Trial.h"
+#include "rules/Tail.h"
 
 namespace morvik::doctor {
 
@@ -116,7 +117,7 @@ private:
     bool areRowsRight() const
     {
         return std::all_of(itsCases.begin(), itsCases.end(), [](const Case& block) {
-            return block.received.size() == block.sent.size() + 4;
+            return block.received.size() == block.sent.size() + rules::tailPositions;
         });
     }
 

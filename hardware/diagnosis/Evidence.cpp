@@ -145,7 +145,7 @@ std::vector<Suspicion> suspicions(const std::vector<Case>& cases)
 std::vector<Suspicion> suspicionsOfSmallerSizes(const std::vector<Case>& cases)
 {
     std::vector<Suspicion> found;
-    for (const standard::BlockSize& size : standard::blockSizes) {
+    for (const rules::BlockSize& size : rules::blockSizes) {
         if (size.K < cases.front().sent.size()) {
             Mistakes mistakes;
             mistakes.rows = Rows::smaller;

@@ -62,8 +62,7 @@ void Passes::next()
 
 std::int16_t Passes::value(unsigned signal, std::uint32_t step) const
 {
-    constexpr int bitsBelowEighth = 4;
-    return static_cast<std::int16_t>(alignedValue(itsComponent, signal, step) >> bitsBelowEighth);
+    return static_cast<std::int16_t>(rules::integerOf(alignedValue(itsComponent, signal, step), rules::stateAlignment));
 }
 
 bool Passes::isComputed(unsigned signal, std::uint32_t step) const

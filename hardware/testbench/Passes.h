@@ -8,6 +8,7 @@
 
 #include "Decoder.h"
 #include "rules/Cut.h"
+#include "rules/Formats.h"
 #include "rules/Schedule.h"
 
 class TDecoder3GPU;
@@ -21,7 +22,7 @@ constexpr std::array<const char*, 23> passSignals = {"intrinsic", "g0",     "g1"
                                                      "beta5",     "beta6",  "beta7",  "llr",    "extrinsic"};
 
 /// Bits of each, in two's complement, in eighths: -2048 stands for -256, 2047 for 255.875.
-constexpr unsigned passBits = 12;
+constexpr unsigned passBits = rules::stateBits;
 
 /// A constituent code by the encoder that it is of: half-iteration 0 decodes the second, the interleaved one (rule 15).
 constexpr unsigned constituentCode(unsigned halfIteration)

@@ -38,7 +38,7 @@ tables::Table internalTable()
 /// Refuses a row that cannot belong to a set of blocks.
 void checkBlock(const tables::Row& row, std::uint32_t iterations, const std::string& place)
 {
-    if (standard::findBlockSize(static_cast<std::uint32_t>(row[0])) == nullptr) {
+    if (rules::findBlockSize(static_cast<std::uint32_t>(row[0])) == nullptr) {
         throw base::Error(place + ": block_size " + std::to_string(row[0]) + " is none of 3GPP TS 36.212");
     }
     if (row[1] != iterations) {

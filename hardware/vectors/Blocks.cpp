@@ -10,6 +10,7 @@
 #include "link/FrameSource.h"
 #include "rules/BlockSizes.h"
 #include "rules/Cut.h"
+#include "rules/SoftValues.h"
 
 namespace morvik::vectors {
 
@@ -134,7 +135,7 @@ private:
 
     std::uint32_t nextTag()
     {
-        return itsTag++ & ((std::uint32_t{1} << itsSettings.generics.C_TAG_WIDTH % 32) - 1);
+        return itsTag++ & rules::tagMask(static_cast<std::uint32_t>(itsSettings.generics.C_TAG_WIDTH));
     }
 
     const Settings& itsSettings;
@@ -160,7 +161,7 @@ void takeDirected(const Settings& settings, Source& source)
             frame++);
     }
     for (const std::uint32_t tag : edgeTags(static_cast<unsigned>(settings.generics.C_TAG_WIDTH))) {
-        source.takeFrame("tag_" + std::to_string(tag), standard::blockSizes.front().K, frame++, tag);
+        source.takeFrame("tag_" + std::to_string(tag), rules::blockSizes.front().K, frame++, tag);
     }
 }
 
@@ -181,10 +182,10 @@ void forEachStimulus(const Settings& settings, const std::function<void(const St
 
 std::vector<unsigned> edgeSizes(unsigned units)
 {
-    std::vector<unsigned> sizes = {standard::blockSizes.front().K};
-    for (std::size_t i = 1; i < standard::blockSizes.size(); ++i) {
-        const unsigned before = standard::blockSizes[i - 1].K;
-        const unsigned K = standard::blockSizes[i].K;
+    std::vector<unsigned> sizes = {rules::blockSizes.front().K};
+    for (std::size_t i = 1; i < rules::blockSizes.size(); ++i) {
+        const unsigned before = rules::blockSizes[i - 1].K;
+        const unsigned K = rules::blockSizes[i].K;
         const rules::Cut cutBefore(before, units);
         const rules::Cut cut(K, units);
         const bool isOther = cut.segments() != cutBefore.segments() || cut.rows() != cutBefore.rows();
@@ -193,7 +194,7 @@ std::vector<unsigned> edgeSizes(unsigned units)
             sizes.push_back(K);
         }
     }
-    sizes.push_back(standard::blockSizes.back().K);
+    sizes.push_back(rules::blockSizes.back().K);
     sizes.erase(std::unique(sizes.begin(), sizes.end()), sizes.end());
     return sizes;
 }

@@ -1,6 +1,7 @@
 // Core: the model as the source of what is expected.
 #include "Core.h"
 
+#include "rules/Formats.h"
 #include "rules/Tail.h"
 
 namespace morvik::vectors {
@@ -48,9 +49,8 @@ Expected Core::expect(const Stimulus& stimulus)
     expected.bits = std::move(decoded.bits);
     if (itsSettings.ratios) {
         expected.ratios = std::move(decoded.ratios);
-        constexpr int unitsOfEighth = 16;  // the interface counts 128 to one
         for (std::int16_t& ratio : expected.ratios) {
-            ratio = static_cast<std::int16_t>(ratio / unitsOfEighth);
+            ratio = static_cast<std::int16_t>(ratio / (1 << rules::stateAlignment));
         }
     }
     if (itsSettings.internal) {

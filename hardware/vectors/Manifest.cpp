@@ -70,7 +70,7 @@ std::vector<unsigned> blockSizesFrom(const base::JsonMembers& json)
     std::vector<unsigned> sizes;
     for (const base::Json& size : json.list("block_sizes")) {
         if (!size.is_number_unsigned() || size.get<std::uint64_t>() > UINT32_MAX ||
-            standard::findBlockSize(size.get<std::uint32_t>()) == nullptr) {
+            rules::findBlockSize(size.get<std::uint32_t>()) == nullptr) {
             json.refuse("block_sizes", "allowed are lists of block sizes of 3GPP TS 36.212");
         }
         sizes.push_back(size.get<unsigned>());

@@ -6,20 +6,21 @@
 #include "rules/Arithmetic.h"
 #include "rules/Cut.h"
 #include "rules/Schedule.h"
+#include "rules/Starts.h"
 #include "rules/Trellis.h"
 
 namespace morvik::faults {
 
 namespace {
 
-using Tail = trellis::Tail<int>;
-using TailColumn = std::array<int, trellis::stateCount>;
+using Tail = rules::Tail<int>;
+using TailColumn = std::array<int, rules::stateCount>;
 
 T8 masked(const T8& column, int mask)
 {
     T8 kept{};
-    for (unsigned state = 0; state < trellis::stateCount; ++state) {
-        kept[state] = arithmetic::wrap16(column[state] & mask);
+    for (unsigned state = 0; state < rules::stateCount; ++state) {
+        kept[state] = rules::wrap16(column[state] & mask);
     }
     return kept;
 }
@@ -85,7 +86,7 @@ protected:
     /// A column as it is kept.
     virtual T8 border(const T8& column) const
     {
-        return masked(column, arithmetic::borderMask);
+        return masked(column, rules::borderMask);
     }
 
     std::vector<T8>& forwardStarts(unsigned h)
@@ -131,7 +132,7 @@ private:
 
     virtual TailColumn tailMetrics(const Tail& tail) const
     {
-        return trellis::tailColumn(tail);
+        return rules::tailColumn(tail);
     }
 
     virtual T8 keptTail(const T8& column) const
@@ -150,8 +151,8 @@ private:
         }
         const TailColumn metrics = tailMetrics(tail);
         T8 column{};
-        for (unsigned state = 0; state < trellis::stateCount; ++state) {
-            column[state] = arithmetic::wrap16(metrics[state]);
+        for (unsigned state = 0; state < rules::stateCount; ++state) {
+            column[state] = rules::wrap16(metrics[state]);
         }
         return keptTail(column);
     }
@@ -295,7 +296,7 @@ class TailSign : public Borders {
     /// The first step's branch metric counts for state 0 as it does for state 1.
     TailColumn tailMetrics(const Tail& tail) const override
     {
-        TailColumn metrics = trellis::tailColumn(tail);
+        TailColumn metrics = rules::tailColumn(tail);
         metrics[0] = metrics[1];
         return metrics;
     }
@@ -308,7 +309,7 @@ class ClippedTail : public Borders {
     TailColumn tailMetrics(const Tail& tail) const override
     {
         const auto sum = [&tail](unsigned step, int sign) {
-            return arithmetic::clip(tail.x[step] + sign * tail.p[step], -2048, 2032);
+            return rules::clip(tail.x[step] + sign * tail.p[step], -2048, 2032);
         };
         const int e2 = sum(2, 1);
         const int e1 = sum(1, 1);

@@ -12,8 +12,8 @@ namespace morvik::faults {
 
 namespace {
 
-using arithmetic::clip;
-using arithmetic::wrap16;
+using morvik::rules::clip;
+using morvik::rules::wrap16;
 
 constexpr int lowestBranch = -2048;
 constexpr int highestBranch = 2032;
@@ -273,25 +273,25 @@ struct ElevenBits {
 };
 
 template <class Sum>
-std::array<Metric<Sum>, trellis::stateCount> metrics(const T8& column)
+std::array<Metric<Sum>, rules::stateCount> metrics(const T8& column)
 {
-    std::array<Metric<Sum>, trellis::stateCount> values{};
-    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+    std::array<Metric<Sum>, rules::stateCount> values{};
+    for (unsigned state = 0; state < rules::stateCount; ++state) {
         values[state].value = column[state];
     }
     return values;
 }
 
 template <class Sum>
-trellis::BranchMetrics<Metric<Sum>> branches(const T8& g)
+rules::BranchMetrics<Metric<Sum>> branches(const T8& g)
 {
     return {{{g[0]}, {g[1]}, {g[2]}, {g[3]}}};
 }
 
 template <class Sum>
-void store(const std::array<Metric<Sum>, trellis::stateCount>& values, T8& column)
+void store(const std::array<Metric<Sum>, rules::stateCount>& values, T8& column)
 {
-    for (unsigned state = 0; state < trellis::stateCount; ++state) {
+    for (unsigned state = 0; state < rules::stateCount; ++state) {
         column[state] = values[state].value;
     }
 }
@@ -306,13 +306,13 @@ public:
     {
         for (unsigned k = 0; k < n; ++k) {
             out[k] =
-                trellis::logLikelihoodRatio(itsRule, metrics<Sum>(a[k]), metrics<Sum>(b[k]), branches<Sum>(g[k])).value;
+                rules::logLikelihoodRatio(itsRule, metrics<Sum>(a[k]), metrics<Sum>(b[k]), branches<Sum>(g[k])).value;
         }
         return out + n;
     }
 
 protected:
-    trellis::DecideMax<Metric<Sum>> itsRule;
+    rules::DecideMax<Metric<Sum>> itsRule;
 };
 
 /// All of max-log-MAP in another arithmetic.
@@ -324,7 +324,7 @@ public:
     T8* alpha(unsigned n, const T8* g, T8* a) override
     {
         for (unsigned j = 1; j < n; ++j) {
-            store(trellis::forwardStep(this->itsRule, metrics<Sum>(a[j - 1]), branches<Sum>(g[j - 1])), a[j]);
+            store(rules::forwardStep(this->itsRule, metrics<Sum>(a[j - 1]), branches<Sum>(g[j - 1])), a[j]);
         }
         return a + n;
     }
@@ -332,7 +332,7 @@ public:
     T8* beta(unsigned n, const T8* g, T8* b) override
     {
         for (unsigned j = 1; j < n; ++j, --g, --b) {
-            store(trellis::backwardStep(this->itsRule, metrics<Sum>(*b), branches<Sum>(*g)), *(b - 1));
+            store(rules::backwardStep(this->itsRule, metrics<Sum>(*b), branches<Sum>(*g)), *(b - 1));
         }
         return b - 1;
     }
@@ -344,16 +344,16 @@ class UnwrappedRatios : public FaultyEngine {
 
     short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
     {
-        const trellis::DecideMax<short> rule;
+        const rules::DecideMax<short> rule;
         const auto column = [](const T8& values) {
-            std::array<short, trellis::stateCount> copy{};
+            std::array<short, rules::stateCount> copy{};
             std::copy_n(values.metric, copy.size(), copy.begin());
             return copy;
         };
         for (unsigned k = 0; k < n; ++k) {
-            const trellis::BranchMetrics<short> of = {g[k][0], g[k][1], g[k][2], g[k][3]};
-            const int one = trellis::bestPath<1>(rule, column(a[k]), column(b[k]), of);
-            const int zero = trellis::bestPath<0>(rule, column(a[k]), column(b[k]), of);
+            const rules::BranchMetrics<short> of = {g[k][0], g[k][1], g[k][2], g[k][3]};
+            const int one = rules::bestPath<1>(rule, column(a[k]), column(b[k]), of);
+            const int zero = rules::bestPath<0>(rule, column(a[k]), column(b[k]), of);
             out[k] = Saturated::of(one - zero);
         }
         return out + n;

@@ -9,9 +9,9 @@ namespace morvik::faults {
 
 namespace {
 
-using arithmetic::maskBits;
-using arithmetic::shiftRight;
-using arithmetic::wrap16;
+using morvik::rules::maskBits;
+using morvik::rules::shiftRight;
+using morvik::rules::wrap16;
 
 /// The extrinsic values of a pass are altered once they are computed.
 class AlteredExtrinsic : public FaultyDecoder {

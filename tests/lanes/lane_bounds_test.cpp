@@ -19,9 +19,11 @@
 #include "lanes/Bounds.h"
 #include "rules/Trellis.h"
 
+namespace rules = morvik::rules;
+
 namespace {
 
-using trellis::stateCount;
+using morvik::rules::stateCount;
 
 /// What a decision of MOD# may add to its winner, in steps.
 constexpr int mostCorrection = 6;
@@ -82,7 +84,7 @@ Leads leadsOf(const std::array<int, stateCount>& metrics)
 /// Whether two pairs of states have the same branch metric: LTE has no second parity stream (rule 5).
 bool shareBranch(unsigned pair, unsigned other)
 {
-    const auto sums = trellis::branchSums(1, 10, 0);
+    const auto sums = rules::branchSums(1, 10, 0);
     return sums[pair] == sums[other];
 }
 
@@ -115,13 +117,13 @@ enum class Direction { forward, backward };
 
 unsigned origin(Direction direction, unsigned state, unsigned bit)
 {
-    return direction == Direction::forward ? trellis::predecessor(state, bit) : trellis::successor(state, bit);
+    return direction == Direction::forward ? rules::predecessor(state, bit) : rules::successor(state, bit);
 }
 
 /// The pair whose branch metric the two candidates of a state share.
 unsigned pairInto(Direction direction, unsigned state)
 {
-    return trellis::branch(direction == Direction::forward ? trellis::predecessor(state, 1) : state);
+    return rules::branch(direction == Direction::forward ? rules::predecessor(state, 1) : state);
 }
 
 Leads step(Direction direction, const Leads& before)
@@ -190,7 +192,7 @@ Leads tailColumn()
             return (signs >> i & 1U) != 0 ? lanes::branchMax : lanes::branchMin;
         };
         leads = either(leads,
-                       leadsOf(trellis::tailColumn<int>(
+                       leadsOf(rules::tailColumn<int>(
                            {{value(0), value(1), value(2)}, {value(3), value(4), value(5)}, {0, 0, 0}})));
     }
     return kept(leads);
@@ -233,8 +235,8 @@ int branchLead(const Leads& a, const Leads& b, unsigned s, unsigned bit, unsigne
 {
     const int own = signOf(bit);
     const int others = signOf(other);
-    const int metrics = a[s][t] + b[trellis::successor(s, bit)][trellis::successor(t, other)];
-    if (!shareBranch(trellis::branch(s), trellis::branch(t))) {
+    const int metrics = a[s][t] + b[rules::successor(s, bit)][rules::successor(t, other)];
+    if (!shareBranch(rules::branch(s), rules::branch(t))) {
         return metrics + greatestBranch(own) + greatestBranch(-others);
     }
     return metrics + (own == others ? 0 : 2 * greatestBranch(own));

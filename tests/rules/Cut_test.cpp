@@ -72,7 +72,7 @@ TEST(Cut, OfNoBlockHasNoWindow)
 
 TEST(Cut, WindowsCoverEachStepOnceRowByRow)
 {
-    for (const auto& size : standard::blockSizes) {
+    for (const auto& size : morvik::rules::blockSizes) {
         for (const unsigned units : {2U, 4U, 8U}) {
             const Cut cut(size.K, units);
             std::vector<unsigned> covered(size.K);

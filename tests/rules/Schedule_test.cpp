@@ -48,7 +48,7 @@ TEST(Tail, HasTheOrderOfTheStandard)
 
 TEST(Interleaver, IsThatOfThePlainDecoder)
 {
-    for (const auto& size : standard::blockSizes) {
+    for (const auto& size : morvik::rules::blockSizes) {
         const std::vector<unsigned> plain = morvik::plain::permutation(size.K);
         ASSERT_EQ(plain.size(), size.K);
         InterleaverAddress address(size);

@@ -89,7 +89,7 @@ TEST(Plan, ChoosesEbn0ByTheSizeWhereItIsNotGiven)
     EXPECT_EQ(seen[0], usualMilliDecibels(40));
     EXPECT_EQ(seen[1], usualMilliDecibels(512));
     EXPECT_EQ(seen[2], usualMilliDecibels(6144));
-    for (const standard::BlockSize& size : standard::blockSizes) {
+    for (const morvik::rules::BlockSize& size : morvik::rules::blockSizes) {
         EXPECT_GE(usualMilliDecibels(size.K).size(), 10U) << size.K;
         EXPECT_TRUE(std::is_sorted(seen[0].begin(), seen[0].end()));
     }

@@ -13,6 +13,7 @@
 
 #include "ThreadMessages.h"
 #include "morvik_v1_0_batch.h"
+#include "rules/Tail.h"
 
 namespace morvik::python {
 
@@ -39,7 +40,9 @@ struct Batch {
 
     std::size_t blockSize() const
     {
-        return positions > 4 ? static_cast<std::size_t>(positions) - 4 : 0;
+        return positions > std::int32_t{rules::tailPositions}
+                   ? static_cast<std::size_t>(positions) - rules::tailPositions
+                   : 0;
     }
 };
 

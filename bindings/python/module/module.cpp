@@ -19,6 +19,9 @@
 #include "link/DefaultScale.h"
 #include "link/TurboEncoder.h"
 #include "rules/BlockSizes.h"
+#include "rules/Tail.h"
+
+namespace rules = morvik::rules;
 
 namespace py = pybind11;
 using namespace morvik::python;
@@ -73,11 +76,11 @@ py::tuple decode(Decoder& decoder,
 {
     const py::ssize_t blocks = tags.size();
     const py::ssize_t positions = sys.shape(1);
-    Array<std::uint8_t> bits({blocks, positions - 4});
+    Array<std::uint8_t> bits({blocks, positions - morvik::rules::tailPositions});
     Array<std::uint32_t> keptTags(blocks);
     std::optional<Array<std::int16_t>> ratios;
     if (wantsRatios) {
-        ratios.emplace(std::vector{blocks, positions - 4});
+        ratios.emplace(std::vector{blocks, positions - morvik::rules::tailPositions});
     }
 
     Batch<Input> batch;
@@ -138,7 +141,7 @@ void addDecoder(py::module_& module)
 
 Array<std::int64_t> interleaver(unsigned K)
 {
-    const standard::BlockSize& row = *standard::findBlockSize(K);
+    const rules::BlockSize& row = *rules::findBlockSize(K);
     Array<std::int64_t> positions(static_cast<py::ssize_t>(K));
     for (std::uint64_t i = 0; i < K; ++i) {
         positions.mutable_data()[i] = static_cast<std::int64_t>((row.f1 * i + row.f2 * i * i) % K);
@@ -169,7 +172,7 @@ py::tuple encode(const Array<std::uint8_t>& bits)
     std::array<Array<std::uint8_t>, 3> streams;
     std::array<std::uint8_t*, 3> to{};
     for (std::size_t s = 0; s < streams.size(); ++s) {
-        streams[s] = Array<std::uint8_t>({bits.shape(0), bits.shape(1) + 4});
+        streams[s] = Array<std::uint8_t>({bits.shape(0), bits.shape(1) + morvik::rules::tailPositions});
         to[s] = streams[s].mutable_data();
     }
     const std::uint8_t* from = bits.data();
@@ -187,7 +190,9 @@ py::tuple encode(const Array<std::uint8_t>& bits)
             encoder.encode(information, now, encoded);
             for (std::size_t s = 0; s < streams.size(); ++s) {
                 for (unsigned b = 0; b < now; ++b) {
-                    unpack(encoded[s].block(b), K + 4, to[s] + (done + b) * (K + 4));
+                    unpack(encoded[s].block(b),
+                           K + morvik::rules::tailPositions,
+                           to[s] + (done + b) * (K + morvik::rules::tailPositions));
                 }
             }
         }
@@ -197,9 +202,9 @@ py::tuple encode(const Array<std::uint8_t>& bits)
 
 void addLink(py::module_& module)
 {
-    py::tuple sizes(standard::blockSizes.size());
-    for (std::size_t i = 0; i < standard::blockSizes.size(); ++i) {
-        sizes[i] = standard::blockSizes[i].K;
+    py::tuple sizes(rules::blockSizes.size());
+    for (std::size_t i = 0; i < rules::blockSizes.size(); ++i) {
+        sizes[i] = rules::blockSizes[i].K;
     }
     module.attr("block_sizes") = sizes;
     module.def("interleaver", interleaver, py::arg("block_size"));

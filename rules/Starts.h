@@ -1,0 +1,27 @@
+// Starts: the columns that recursions start from, and what is kept of those that they leave.
+//
+// The numbered rules are those of docs/arithmetic.md.
+#ifndef MORVIK_RULES_STARTS_H
+#define MORVIK_RULES_STARTS_H
+
+#include "rules/Arithmetic.h"
+
+namespace morvik::rules {
+
+/// A state's metric where the encoder is known to be in state 0: half the format's most negative one for all others
+/// (rule 10).
+template <class Number>
+constexpr Number knownMetric(unsigned state, Number mostNegative)
+{
+    return state == 0 ? Number{0} : static_cast<Number>(mostNegative / 2);
+}
+
+/// Every state's metric where nothing is known (rule 10).
+constexpr Value unknownMetric = 0;
+
+/// The bits that a column keeps at the border between two segments or windows: it loses its seven low ones (rule 11).
+constexpr Value borderMask = wrap16(0xFF80);
+
+}  // namespace morvik::rules
+
+#endif
