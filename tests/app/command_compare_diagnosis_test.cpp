@@ -1,0 +1,253 @@
+// The command morvik compare: what it says of cores with a fault, and of dumps of another run.
+#include <algorithm>
+#include <ostream>
+#include <sstream>
+
+#include "CompareTest.h"
+
+namespace {
+
+using namespace morvik::support;
+
+/// A core with a fault, and what the command has to say of its dump.
+struct FaultCase {
+    const char* fault;
+    unsigned K;
+    int units;
+    int algorithm;
+    unsigned halfIteration;  ///< of the first difference
+    const char* operation;   ///< at fault
+    const char* found;       ///< the pattern; empty when none is known
+    int amplitude = 16;
+};
+
+std::ostream& operator<<(std::ostream& out, const FaultCase& each)
+{
+    return out << each.fault;
+}
+
+class FaultyCore : public Compare, public testing::WithParamInterface<FaultCase> {};
+
+TEST_P(FaultyCore, IsFoundAtItsPlace)
+{
+    const FaultCase& given = GetParam();
+    writeBlock(given.K, given.amplitude);
+    writeDump(given.fault, given.units, given.algorithm);
+    const CommandResult result =
+        compare({"--num-pu", std::to_string(given.units), "--algorithm", std::to_string(given.algorithm)});
+    EXPECT_EQ(result.status, 1) << result.err;
+    EXPECT_TRUE(has(result.out, "  half-iteration  " + std::to_string(given.halfIteration) + ", on the")) << result.out;
+    EXPECT_TRUE(has(result.out, std::string("At fault: ") + given.operation)) << result.out;
+    EXPECT_TRUE(has(result.out, given.found)) << result.out;
+    if (std::getenv("MORVIK_SHOW_REPORTS") != nullptr) {
+        std::cout << result.out;
+    }
+}
+
+const char* const intrinsic = "the intrinsic value";
+const char* const branch = "the branch metrics";
+const char* const forward = "the forward recursion";
+const char* const backward = "the backward recursion";
+const char* const ratio = "the log-likelihood ratio";
+const char* const extrinsic = "the extrinsic value";
+const char* const segmentBorder = "the border metrics at the start of the segment";
+const char* const windowBorder = "the border metrics at the start of the window";
+
+INSTANTIATE_TEST_SUITE_P(
+    Faults,
+    FaultyCore,
+    testing::Values(
+        FaultCase{"extrinsic_rounding", 512, 2, 1, 0, extrinsic, "one LSB too high: rounding"},
+        FaultCase{"intrinsic_rounding", 512, 2, 1, 1, intrinsic, "one LSB too high: rounding"},
+        FaultCase{"ratio_rounding", 512, 2, 1, 0, ratio, "no pattern that is known; all are one LSB too high"},
+        FaultCase{
+            "forward_bits_kept", 512, 2, 1, 2, segmentBorder, "the seven low bits of border metrics are not cleared"},
+        FaultCase{
+            "backward_bits_kept", 1088, 2, 1, 2, windowBorder, "the seven low bits of border metrics are not cleared"},
+        FaultCase{"forward_border_unknown", 512, 2, 1, 2, segmentBorder, "start metrics are zeros"},
+        FaultCase{"backward_border_early", 1024, 2, 1, 2, windowBorder, "border metrics are those of the other pass"},
+        FaultCase{"first_state_unknown", 512, 2, 1, 0, "the known state at the beginning", "start metrics are zeros"},
+        FaultCase{"tail_bits_kept", 512, 2, 1, 0, "the metrics of the tail", "the seven low bits of border metrics"},
+        FaultCase{"tail_sign",
+                  512,
+                  2,
+                  1,
+                  1,
+                  "the metrics of the tail",
+                  "starts, on the natural code alone, in beta0 alone:\n  no pattern that is known.\n"},
+        FaultCase{"ratio_sign", 512, 2, 1, 0, ratio, "the sign is flipped"},
+        FaultCase{"extrinsic_sign", 512, 2, 1, 0, extrinsic, "the sign is flipped"},
+        FaultCase{"parity_sign", 512, 2, 1, 0, branch, "the sign of the parity is flipped"},
+        FaultCase{"branch_unclipped", 512, 2, 1, 0, branch, "saturation is missing: the sum is wider", 80},
+        FaultCase{"branch_eight_bits", 512, 2, 1, 0, branch, "saturation is missing: the sum is cut", 80},
+        FaultCase{"extrinsic_unclipped", 512, 2, 1, 0, extrinsic, "saturation is missing: the sum is wider", 80},
+        FaultCase{"metrics_unwrapped", 512, 2, 1, 0, forward, "the wrap is missing", 80},
+        FaultCase{"ratio_unwrapped", 512, 2, 1, 0, ratio, "the wrap is missing: values stay at the end", 48},
+        FaultCase{"apriori_late", 512, 2, 1, 1, intrinsic, "a pass late: values are those of the last pass"},
+        FaultCase{
+            "apriori_before", 512, 2, 1, 1, intrinsic, "a pass late: extrinsic values are those of the pass before"},
+        FaultCase{"apriori_missing", 512, 2, 1, 1, intrinsic, "of the pass before do not arrive"},
+        FaultCase{"apriori_unpermuted", 512, 2, 1, 1, intrinsic, "without the interleaver's permutation"},
+        FaultCase{"apriori_inverse", 512, 2, 1, 1, intrinsic, "by the inverse of the permutation"},
+        FaultCase{"apriori_behind", 512, 2, 1, 1, intrinsic, "by the interleaver's address for the step after"},
+        FaultCase{"systematic_unpermuted", 512, 2, 1, 0, intrinsic, "in the other code's order"},
+        FaultCase{"extrinsic_unscaled", 512, 2, 1, 0, extrinsic, "the factor of 0.75 is missing"},
+        FaultCase{"extrinsic_stuck_bit", 512, 2, 1, 0, extrinsic, "bit 0 is stuck at 1"},
+        FaultCase{"backward_uncorrected", 512, 2, 2, 0, backward, "the correction table is missing"},
+        FaultCase{"forward_corrected_early", 512, 2, 2, 0, forward, "corrections come a decision early"},
+        FaultCase{"forward_state_swapped", 512, 2, 1, 0, forward, "no pattern that is known"},
+        FaultCase{"border_six_bits", 512, 2, 1, 0, "the metrics of the tail", "six low bits of border metrics are"},
+        FaultCase{"border_nine_bits", 512, 2, 1, 0, "the metrics of the tail", "nine low bits of border metrics are"},
+        FaultCase{"border_bit_kept", 512, 2, 1, 2, segmentBorder, "ANDed with 0xFF90, not with 0xFF80 (rule 11)"},
+        FaultCase{
+            "forward_border_stale", 512, 2, 1, 4, segmentBorder, "stay those of the first pass over the same code"},
+        FaultCase{
+            "forward_border_late", 512, 2, 1, 2, segmentBorder, "border metrics are a pass over the same code late"},
+        FaultCase{
+            "forward_border_early", 512, 2, 1, 2, segmentBorder, "border metrics are those of the other pass: this"},
+        FaultCase{
+            "forward_border_other_code", 512, 2, 1, 2, segmentBorder, "metrics are those of the other code's pass"},
+        FaultCase{"backward_border_stale", 1088, 2, 1, 2, windowBorder, "stay those of the first pass over the same"},
+        FaultCase{"tail_clipped", 512, 2, 1, 0, "the metrics of the tail", "the tail's branch sums are clipped", 100},
+        FaultCase{"metrics_eleven_bits", 512, 2, 1, 0, forward, "values are 11 bits wide, not 12 (rule 2)"},
+        FaultCase{"metrics_stored_in_eleven_bits", 512, 2, 1, 0, forward, "values are 11 bits wide, not 12 (rule 2)"},
+        FaultCase{"metrics_kept_in_eleven_bits", 512, 2, 1, 0, forward, "values are 11 bits wide, not 12 (rule 2)"},
+        FaultCase{"parity_negated_in_eight", 512, 2, 1, 0, branch, "is negated in eight bits, where -128 stays", 100},
+        FaultCase{"doubled_in_eight", 512, 2, 1, 1, branch, "twice the intrinsic value is cut to its low eight", 100},
+        FaultCase{"branch_seven_bits", 512, 2, 1, 0, branch, "the sum is clipped to seven bits, not eight"},
+        FaultCase{"extrinsic_symmetric", 512, 2, 1, 0, extrinsic, "the sum is clipped to -127, not -128"},
+        FaultCase{"one_unit_stuck_bit", 512, 2, 1, 0, extrinsic, "in unit 1 alone:\n  bit 1 is stuck at 0.\n"}),
+    [](const testing::TestParamInfo<FaultCase>& each) { return std::string(each.param.fault); });
+
+TEST_F(Compare, NamesAllMistakesThatFit)
+{
+    writeBlock(512);
+    writeDump("forward_border_stale", 2, 1);
+    // What follows from the first wrong values fits to any mistake that leaves it alone.
+    leaveOut("g");
+    const std::string found = compare().out;
+    EXPECT_TRUE(has(found,
+                    "at window edges alone: where segments start:\n"
+                    "  either border metrics are a pass over the same code late (rules 19 and 20), or border metrics "
+                    "stay those of the first pass over the same code (rules 19 and 20).\n"))
+        << found;
+}
+
+TEST_F(Compare, TakesNoBitThatADumpLacksForRounding)
+{
+    writeBlock(512);
+    writeDump("backward_bits_kept", 2, 1);
+    leaveOut("extrinsic");
+    const std::string found = compare().out;
+    EXPECT_TRUE(has(found, "where windows start:\n  the seven low bits of border metrics are not cleared")) << found;
+    EXPECT_FALSE(has(found, "Found in branch metrics")) << found;
+}
+
+TEST_F(Compare, TellsThatRealNumbersLackTheirPoints)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    keepRatios([](const std::string& value) {
+        std::ostringstream real;
+        real << std::stoi(value) / 8.0;  // 9, not 9.0
+        return real.str();
+    });
+    EXPECT_TRUE(has(compare().out, "values are whole numbers where eighths are expected: \"numbers\": \"real\""));
+    morvik.write("map.json", R"({"numbers": "real"})");
+    EXPECT_EQ(compare({"--map", "map.json"}).status, 0);
+}
+
+TEST_F(Compare, TellsThatADumpCountsInAnotherWay)
+{
+    writeBlock(512);
+    writeDump("none", 2, 1);
+    const std::string dump = morvik.read("rtl.csv");
+    writeLater(dump, 1, 0);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "Found: the dump is a pass late, or counts half-iterations from 1;")) << result.out;
+    morvik.write("map.json", R"({"first_half_iteration": 1})");
+    EXPECT_EQ(compare({"--map", "map.json"}).status, 1) << "half-iteration 7 is missing";
+    EXPECT_EQ(compare({"--map", "map.json", "--partial"}).status, 0);
+
+    writeLater(dump, 1, 1);
+    EXPECT_TRUE(has(compare().out, "Found: the dump counts half-iterations and steps from 1;"));
+    morvik.write("map.json", R"({"first_half_iteration": 1, "first_step": 1})");
+    EXPECT_EQ(compare({"--map", "map.json", "--partial"}).status, 0);
+}
+
+TEST_F(Compare, TellsWhichCoreADumpIsOf)
+{
+    writeBlock(512);
+    writeDump("none", 2, 2);
+    const CommandResult result = compare();
+    EXPECT_EQ(result.status, 1);
+    EXPECT_TRUE(has(result.out, "\nFound: the dump is what the model computes with --algorithm table.\n"))
+        << result.out;
+    EXPECT_EQ(compare({"--algorithm", "table"}).status, 0);
+    writeBlock(1088);
+    writeDump("none", 8, 0);
+    EXPECT_TRUE(has(compare().out, "computes with --algorithm max-log and --num-pu 4 or 8.\n"));
+}
+
+TEST_F(Compare, TellsWhichBlockADumpIsOf)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    const std::string rows = morvik.read("block.csv").substr(header.size() + 1);
+    morvik.write("block.csv", header + '\n' + zeroRows("7", 52) + zeroRows("8", 44) + rows);
+    EXPECT_TRUE(has(compare({"--block-number", "1"}).out, "model computes of block 2 of block.csv.\n"));
+    std::string again = rows;
+    for (std::size_t at = 0; at < again.size(); at = again.find('\n', at) + 1) {
+        again[at] = '9';
+    }
+    morvik.write("block.csv", header + '\n' + zeroRows("8", 44) + rows + again);
+    EXPECT_TRUE(has(compare().out, "model computes either of block 1 of block.csv, or of block 2 of block.csv.\n"));
+    morvik.write("block.csv", header + '\n' + zeroRows("7", 44) + "none of the blocks\n" + rows);
+    EXPECT_EQ(compare().status, 1);
+}
+
+TEST_F(Compare, TellsAMistakeInTheBlock)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    const auto expectFound = [&](const morvik::blocks::Block& block, const std::string& what) {
+        morvik.write("block.csv", softText(block));
+        const std::string found = compare().out;
+        EXPECT_TRUE(has(found, "\nFound: the dump is what the model computes if, in the block, " + what + ".\n"))
+            << found;
+    };
+    morvik::blocks::Block block = noisyBlock(40);
+    std::swap(block.par1, block.par2);
+    expectFound(block, "rsc1_par and rsc2_par are swapped");
+    block = noisyBlock(40);
+    for (auto& value : block.par1) {
+        value = -value;
+    }
+    expectFound(block, "the sign of rsc1_par is flipped");
+    block = noisyBlock(40);
+    for (auto* const stream : {&block.sys, &block.par1, &block.par2}) {
+        std::swap_ranges(stream->end() - 4, stream->end() - 2, stream->end() - 2);
+    }
+    expectFound(block, "the tail has the second encoder's values first");
+    block = noisyBlock(40);
+    for (auto* const stream : {&block.sys, &block.par1, &block.par2}) {
+        std::reverse(stream->begin(), stream->end());
+    }
+    expectFound(block, "the rows are in reversed order, tail first");
+}
+
+TEST_F(Compare, TakesFewValuesForNoOtherRun)
+{
+    writeBlock(40);
+    writeDump("none", 2, 2);
+    const std::string all = morvik.read("rtl.csv");
+    std::size_t end = 0;
+    for (int line = 0; line < 50; ++line) {
+        end = all.find('\n', end) + 1;
+    }
+    morvik.write("rtl.csv", all.substr(0, end));
+    EXPECT_FALSE(has(compare().out, "the dump is what the model computes"));
+}
+
+}  // namespace
