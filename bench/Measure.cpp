@@ -2,7 +2,6 @@
 #include "Measure.h"
 
 #include <algorithm>
-#include <stdexcept>
 
 namespace morvik::bench {
 
@@ -42,14 +41,6 @@ Figures medians(const std::vector<Figures>& all)
             of(&Figures::latency),
             of(&Figures::ratio),
             of(&Figures::bitErrorRate)};
-}
-
-void checkDecisions(const Work& work, double bitErrorRate)
-{
-    if (bitErrorRate > 0.1) {
-        throw std::runtime_error(work.name() + ": the decoder decides wrongly, bit error rate " +
-                                 std::to_string(bitErrorRate));
-    }
 }
 
 }  // namespace morvik::bench

@@ -26,10 +26,6 @@ Figures figures(const Work& work, const Decoding& decoding, const Sample& sample
 /// The median of each figure.
 Figures medians(const std::vector<Figures>& all);
 
-/// Throws if the decisions are so bad that the figures are meaningless: without a decoder, more than every sixth bit
-/// would be wrong.
-void checkDecisions(const Work& work, double bitErrorRate);
-
 }  // namespace morvik::bench
 
 #endif

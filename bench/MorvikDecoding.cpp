@@ -43,7 +43,31 @@ public:
         }
     }
 
+    /// Bits, and for batches ratios, must be those of the components, which define them.
+    void check() override
+    {
+        Work definition = itsWork;
+        definition.call = Work::Call::batch;
+        definition.instructionSet = "component";
+        MorvikDecoding components(definition);
+        const Ratios expected = components.runWithRatios();
+        run();
+        expect(itsDecisions == components.itsDecisions, "bits");
+        if (itsWork.call == Work::Call::batch) {
+            expect(runWithRatios() == expected, "ratios");
+        }
+    }
+
 private:
+    using Ratios = std::vector<std::int16_t>;
+
+    void expect(bool same, const char* what) const
+    {
+        if (!same) {
+            throw std::runtime_error(itsWork.name() + ": decodes to other " + what + " than the components");
+        }
+    }
+
     std::int32_t positions() const
     {
         return static_cast<std::int32_t>(itsWork.blockSize + rules::tailPositions);
@@ -58,33 +82,42 @@ private:
     {
         veltra_ip_morvik_v1_0_outputs outputs = {
             itsDecisions.data() + std::size_t{block} * itsWork.blockSize, itsWork.blockSize, 0, 0};
-        check(veltra_ip_morvik_v1_0_bitacc_simulate(itsState.get(),
-                                                    stream(0, block),
-                                                    stream(1, block),
-                                                    stream(2, block),
-                                                    positions(),
-                                                    iterations,
-                                                    0,
-                                                    &outputs));
+        expectSuccess(veltra_ip_morvik_v1_0_bitacc_simulate(itsState.get(),
+                                                            stream(0, block),
+                                                            stream(1, block),
+                                                            stream(2, block),
+                                                            positions(),
+                                                            iterations,
+                                                            0,
+                                                            &outputs));
     }
 
-    void runBatch()
+    Ratios runWithRatios()
     {
+        Ratios ratios(itsDecisions.size());
         veltra_ip_morvik_v1_0_batch_outputs outputs = {};
+        outputs.ratios = ratios.data();
+        outputs.ratios_alloc = ratios.size();
+        runBatch(outputs);
+        return ratios;
+    }
+
+    void runBatch(veltra_ip_morvik_v1_0_batch_outputs outputs = {})
+    {
         outputs.dout = itsDecisions.data();
         outputs.dout_alloc = itsDecisions.size();
-        check(veltra_ip_morvik_v1_0_batch_simulate_i32(itsState.get(),
-                                                       stream(0, 0),
-                                                       stream(1, 0),
-                                                       stream(2, 0),
-                                                       positions(),
-                                                       itsWork.blocks,
-                                                       iterations,
-                                                       nullptr,
-                                                       &outputs));
+        expectSuccess(veltra_ip_morvik_v1_0_batch_simulate_i32(itsState.get(),
+                                                               stream(0, 0),
+                                                               stream(1, 0),
+                                                               stream(2, 0),
+                                                               positions(),
+                                                               itsWork.blocks,
+                                                               iterations,
+                                                               nullptr,
+                                                               &outputs));
     }
 
-    void check(std::int32_t status) const
+    void expectSuccess(std::int32_t status) const
     {
         if (status != 0) {
             throw std::runtime_error(itsWork.name() + ": status " + std::to_string(status));

@@ -12,6 +12,7 @@ struct Options {
     unsigned repetitions = 5;
     double seconds = 0.2;
     bool list = false;
+    std::string json;
 };
 
 inline void addOptions(CLI::App& app, Options& options)
@@ -21,6 +22,7 @@ inline void addOptions(CLI::App& app, Options& options)
         ->check(CLI::Range(1U, 1000U));
     app.add_option("--seconds", options.seconds, "That a repetition takes at least")->check(CLI::Range(0.0, 100.0));
     app.add_flag("--list", options.list, "Only print the names of the lines");
+    app.add_option("--json", options.json, "Also write the figures of all repetitions to this file");
 }
 
 }  // namespace morvik::bench

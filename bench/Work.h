@@ -50,6 +50,9 @@ public:
     /// Decodes all blocks once.
     virtual void run() = 0;
 
+    /// Decodes all blocks once. Throws when they are decoded wrongly: figures would stand for nothing.
+    virtual void check() = 0;
+
     /// Fraction of the decided bits that differ from the transmitted ones.
     double bitErrorRate() const;
 

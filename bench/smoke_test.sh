@@ -1,9 +1,11 @@
 #!/usr/bin/env bash
 # Runs the short lines of the benchmarks for a moment: they must succeed, which includes that the decoders
 # decided rightly, and print whole tables.
-#   smoke_test.sh MORVIK_BENCH_PLAIN MORVIK_BENCH_FRAMES
+#   smoke_test.sh MORVIK_BENCH MORVIK_BENCH_FRAMES MORVIK_BENCH_BROKEN
 set -euo pipefail
-output=$("$1" --filter 'K=40/|compare/K=512/' --repetitions 2 --seconds 0.001)
+json=$(mktemp)
+trap 'rm -f "$json"' EXIT
+output=$("$1" --filter 'K=40/|compare/K=512/' --repetitions 2 --seconds 0.001 --json "$json")
 fail() {
     echo "smoke_test.sh: $1 in:" >&2
     echo "$output" >&2
@@ -27,6 +29,21 @@ expect 1 'probe of what every machine has' "^\\| generic +\\| +8 \\|($positive) 
 if "$1" --filter 'no such line' >/dev/null 2>&1; then
     fail 'a filter that matches nothing is accepted'
 fi
+
+python3 - "$json" <<'PYTHON' || fail 'the JSON is not that'
+import json, sys
+lines = json.load(open(sys.argv[1]))["benchmarks"]
+assert len(lines) >= 8 and all(line["Mbit/s"] > 0 for line in lines), lines
+assert [line["repetition"] for line in lines] == [0, 1] * (len(lines) // 2), lines
+PYTHON
+
+# What decodes wrongly is not measured.
+for filter in '^K=40/batch' 'compare/K=512/batch'; do
+    if output=$("$3" --filter "$filter" --repetitions 1 --seconds 0 2>&1); then
+        fail 'a wrong bit is not noticed'
+    fi
+    expect 1 'message on a wrong bit' '^morvik_bench: .*/batch/.*: decodes to other bits than the components$'
+done
 
 output=$("$2" --repetitions 1 --seconds 0)
 expect 1 'table of frames' '^\| +K \| frames a call \| instructions \|.*\| make / decode \|$'
