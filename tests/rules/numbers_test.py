@@ -10,7 +10,7 @@ import re
 import sys
 
 RULES = 22
-STANDARD = {"algorithm", "array", "cmath", "cstdint", "type_traits", "utility"}
+STANDARD = {"algorithm", "array", "cmath", "cstddef", "cstdint", "optional", "string_view", "type_traits", "utility"}
 
 
 def numbers_in(comment):
