@@ -20,7 +20,7 @@ constexpr std::uint32_t longestWindow = 64;
 constexpr std::uint32_t segmentCount(std::uint32_t K, std::uint64_t threads)
 {
     std::uint64_t count = 1;
-    while (count < threads && 2 * longestWindow * count <= K) {
+    while (count < threads && 2 * count * longestWindow <= K) {
         count *= 2;
     }
     return static_cast<std::uint32_t>(count);
