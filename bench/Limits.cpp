@@ -10,25 +10,21 @@
 #include "rules/Cut.h"
 
 // Each compilation of Probe.cpp defines one of these.
-namespace probe_generic {
-extern const morvik::bench::ProbeSet probeSet;
-}
-namespace probe_ssse3 {
-extern const morvik::bench::ProbeSet probeSet;
-}
-namespace probe_avx2 {
-extern const morvik::bench::ProbeSet probeSet;
-}
-namespace probe_avx512 {
-extern const morvik::bench::ProbeSet probeSet;
-}
+#define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) \
+    namespace probe_##name                               \
+    {                                                    \
+        extern const morvik::bench::ProbeSet probeSet;   \
+    }
+#include "lanes/InstructionSets.def"
 
 namespace morvik::bench {
 
 namespace {
 
 const ProbeSet* const probeSets[] = {
-    &probe_avx512::probeSet, &probe_avx2::probeSet, &probe_ssse3::probeSet, &probe_generic::probeSet};
+#define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) &probe_##name::probeSet,
+#include "lanes/InstructionSets.def"
+};
 
 double cyclesOf(const Probe& probe)
 {

@@ -4,6 +4,7 @@
 #include <string>
 #include <string_view>
 
+#include "InstructionSetNames.h"
 #include "Messages.h"
 #include "PathChoice.h"
 #include "SimulationCall.h"
@@ -11,13 +12,12 @@
 namespace {
 
 using namespace simulation_call;
+using morvik::byComponents;
 using Outputs = veltra_ip_morvik_v1_0_batch_outputs;
 using State = veltra_ip_morvik_v1_0_state;
 
 template <class Input>
 using Streams = lanes::Streams<Input>;
-
-constexpr const char* byComponents = "component";
 
 std::int32_t simulateGuarded(State* state, const Batch& batch, Outputs* outputs)
 {

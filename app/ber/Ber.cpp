@@ -24,6 +24,7 @@
 #include "simulation/Replay.h"
 #include "simulation/Run.h"
 #include "simulation/ThreadWorkers.h"
+#include "src/InstructionSetNames.h"
 
 namespace morvik {
 
@@ -70,7 +71,7 @@ void checkInstructionSet(const std::string& name)
     }
     std::string message = "--instruction-set: " + base::shown(name) + " is not allowed, this machine has";
     const char* separator = " ";
-    for (const char* const each : {"avx512", "avx2", "ssse3", "generic", "component"}) {
+    for (const char* const each : instructionSetNames) {
         if (hasInstructionSet(each)) {
             message += separator + std::string(each);
             separator = ", ";

@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <array>
 #include <functional>
+#include <iterator>
 #include <utility>
 #include <vector>
 
@@ -14,6 +15,7 @@
 #include "base/Numbers.h"
 #include "base/Shown.h"
 #include "base/Thousandths.h"
+#include "src/InstructionSetNames.h"
 
 namespace morvik {
 
@@ -242,16 +244,27 @@ void addRuleOptions(CLI::App& command, BerOptions& options)
         ->default_str("1");
 }
 
+/// "a, b or c".
+std::string anyOf(const std::vector<std::string>& words)
+{
+    std::string text = words.front();
+    for (std::size_t i = 1; i < words.size(); ++i) {
+        text += (i + 1 < words.size() ? ", " : " or ") + words[i];
+    }
+    return text;
+}
+
 void addExecutionOptions(CLI::App& command, BerOptions& options)
 {
     command.add_option("--threads", options.threads, "Threads, each with a decoder; by default as many as cores")
         ->transform(integerFrom(1, 1024))
         ->type_name("N");
+    const std::vector<std::string> instructionSets(std::begin(instructionSetNames), std::end(instructionSetNames));
     command
         .add_option("--instruction-set",
                     options.instructionSet,
-                    "avx512, avx2, ssse3, generic or component; by default the fastest. All give the same results")
-        ->check(offer({"avx512", "avx2", "ssse3", "generic", "component"}))
+                    anyOf(instructionSets) + "; by default the fastest. All give the same results")
+        ->check(offer(instructionSets))
         ->type_name("NAME");
     CLI::Option* const output =
         command.add_option("--output", options.output, "Results, as CSV or JSON by the ending .csv or .json")

@@ -11,13 +11,11 @@
 #include "hardware/testbench/Decoder.h"
 #include "morvik_v1_0_batch.h"
 #include "rules/Tail.h"
+#include "src/InstructionSetNames.h"
 
 namespace morvik::selftest {
 
 namespace {
-
-/// The names of include/morvik_v1_0_batch.h.
-constexpr const char* instructionSets[] = {"avx512", "avx2", "ssse3", "generic", "component"};
 
 using State = std::shared_ptr<veltra_ip_morvik_v1_0_state>;
 
@@ -146,7 +144,7 @@ Decode libraryDecode(int numPu, int algorithm, const std::string& instructionSet
 bool Findings::needs(const Outcome& outcome) const
 {
     return outcome.instructionSet == inUse || outcome.instructionSet == "generic" ||
-           outcome.instructionSet == "component";
+           outcome.instructionSet == byComponents;
 }
 
 std::size_t Findings::configurations() const
@@ -178,7 +176,7 @@ Findings check(const Promise& promised, const MakeDecode& makeDecode)
     }
     findings.blockDigest = digestOf(batches);
     findings.blocksRight = findings.blockDigest == promised.blocks;
-    for (const char* name : instructionSets) {
+    for (const char* name : instructionSetNames) {
         findings.outcomes.push_back(checkInstructionSet(name, batches, promised, makeDecode));
     }
     return findings;

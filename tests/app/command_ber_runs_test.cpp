@@ -8,6 +8,7 @@
 #include <fstream>
 #include <thread>
 
+#include "src/InstructionSetNames.h"
 #include "support/BerTest.h"
 
 namespace {
@@ -91,7 +92,7 @@ TEST_F(BerRuns, GiveTheSameFilesWithEachInstructionSet)
     const Arguments run = words("--block-size 40,1024 --num-pu 2,4,8 --algorithm 0,1,2 --ebn0 0.5 --frames 0:40");
     const std::string best = berFile(run);
     int sets = 0;
-    for (const std::string name : {"component", "generic", "ssse3", "avx2", "avx512"}) {
+    for (const std::string name : morvik::instructionSetNames) {
         const Arguments choice = run + Arguments{"--instruction-set", name};
         if (morvik.run(Arguments{"ber", "--max-blocks", "1"} + choice).status == 0) {
             EXPECT_EQ(berFile(choice), best) << name;

@@ -10,6 +10,7 @@
 #include "FuzzInput.h"
 #include "morvik_v1_0_batch.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
+#include "src/InstructionSetNames.h"
 
 namespace {
 
@@ -184,8 +185,10 @@ void decodeBatch(FuzzInput& input, State* state, const Block& block)
 /// Any of the names; those that the machine lacks change nothing.
 void changeInstructionSet(FuzzInput& input, State* state)
 {
-    constexpr const char* names[] = {"component", "generic", "ssse3", "avx2", "avx512", "none"};
-    const char* const name = names[input.below(6)];
+    using morvik::instructionSetNames;
+    constexpr auto known = static_cast<unsigned>(std::size(instructionSetNames));
+    const unsigned choice = input.below(known + 1);
+    const char* const name = choice < known ? instructionSetNames[choice] : "none";
     const std::string before = veltra_ip_morvik_v1_0_get_instruction_set(state);
     const std::int32_t status = veltra_ip_morvik_v1_0_set_instruction_set(state, name);
     require(status == 0 || status == 1, "the choice of an instruction set has status 0 or 1");

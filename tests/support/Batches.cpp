@@ -5,6 +5,7 @@
 
 #include "CapturedStreams.h"
 #include "DecoderState.h"
+#include "InstructionSetNames.h"
 
 namespace morvik::blocks {
 
@@ -13,7 +14,7 @@ std::vector<std::string> instructionSets()
     const CapturedStreams silenced;
     const Decoder decoder(2, 0);
     std::vector<std::string> names;
-    for (const char* name : {"avx512", "avx2", "ssse3", "generic", "component"}) {
+    for (const char* name : instructionSetNames) {
         if (veltra_ip_morvik_v1_0_set_instruction_set(decoder.state(), name) == 0) {
             names.emplace_back(name);
         }

@@ -8,6 +8,7 @@
 #include <unistd.h>
 
 #include <cstring>
+#include <iterator>
 #include <optional>
 #include <utility>
 
@@ -20,6 +21,7 @@
 #include "link/TurboEncoder.h"
 #include "rules/BlockSizes.h"
 #include "rules/Tail.h"
+#include "src/InstructionSetNames.h"
 
 namespace rules = morvik::rules;
 
@@ -117,6 +119,11 @@ void addDecode(py::class_<Decoder>& decoder)
 void addDecoder(py::module_& module)
 {
     const veltra_ip_morvik_v1_0_generics usual = veltra_ip_morvik_v1_0_get_default_generics();
+    py::tuple names(std::size(morvik::instructionSetNames));
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        names[i] = morvik::instructionSetNames[i];
+    }
+    module.attr("instruction_sets") = names;
     module.attr("default_num_pu") = usual.C_NUM_PU;
     module.attr("default_algorithm") = usual.C_ALGORITHM_TYPE;
     module.attr("default_tag_width") = usual.C_TAG_WIDTH;

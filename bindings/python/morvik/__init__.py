@@ -17,7 +17,7 @@ from morvik import _core
 _core.expect_main_interpreter()  # an import does not check this again for a module that is already loaded
 
 from morvik._core import __version__
-from morvik._decoder import Decoded, Decoder
+from morvik._decoder import Decoded, Decoder, instruction_sets
 from morvik._errors import DecoderWarning, Error
 from morvik._link import Streams, awgn, block_sizes, encode, interleaver
 from morvik._simulation import error_rate
@@ -33,5 +33,6 @@ __all__ = [
     "block_sizes",
     "encode",
     "error_rate",
+    "instruction_sets",
     "interleaver",
 ]

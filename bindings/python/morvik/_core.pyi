@@ -10,6 +10,7 @@ _Soft = TypeVar("_Soft", np.int8, np.int16, np.int32)
 
 __version__: str
 block_sizes: tuple[int, ...]
+instruction_sets: tuple[str, ...]
 default_num_pu: int
 default_algorithm: int
 default_tag_width: int

@@ -25,6 +25,10 @@ from morvik._arguments import (
 )
 from morvik._errors import DecoderWarning, Error
 
+instruction_sets: tuple[str, ...] = _core.instruction_sets
+"""The names of all instruction sets, the best one first, whether this machine has them or not; the last one is the model's
+components one by one."""
+
 _TAG_LIMIT = 2**32 - 1
 _OUT_OF_MEMORY = 99  # a status of the C interface
 
@@ -56,8 +60,8 @@ class Decoder:
     ``threads``
         Threads among which the blocks of a call are divided; as many as processors when None.
     ``instruction_set``
-        ``"avx512"``, ``"avx2"``, ``"ssse3"``, ``"generic"`` or ``"component"``; the fastest when None. All give the
-        same bits.
+        One of :data:`morvik.instruction_sets` that the machine has, such as ``"generic"``; the fastest when None. All
+        give the same bits.
 
     A refusal raises :class:`morvik.Error`, a ``ValueError``, with the decoder's reason.
 

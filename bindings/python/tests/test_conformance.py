@@ -8,7 +8,17 @@ import morvik
 import numpy as np
 import pytest
 
-INSTRUCTION_SETS = [None, "generic", "component"]
+
+
+def is_available(instruction_set: str) -> bool:
+    try:
+        morvik.Decoder(threads=1, instruction_set=instruction_set).close()
+    except morvik.Error:
+        return False
+    return True
+
+
+INSTRUCTION_SETS = [None, *filter(is_available, morvik.instruction_sets)]
 
 
 class Case(NamedTuple):
