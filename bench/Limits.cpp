@@ -11,9 +11,9 @@
 
 // Each compilation of Probe.cpp defines one of these.
 #define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) \
-    namespace probe_##name                               \
+    namespace morvik::lanes::probe_##name                \
     {                                                    \
-        extern const morvik::bench::ProbeSet probeSet;   \
+        extern const bench::ProbeSet probeSet;           \
     }
 #include "lanes/InstructionSets.def"
 
@@ -22,7 +22,7 @@ namespace morvik::bench {
 namespace {
 
 const ProbeSet* const probeSets[] = {
-#define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) &probe_##name::probeSet,
+#define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) &lanes::probe_##name::probeSet,
 #include "lanes/InstructionSets.def"
 };
 

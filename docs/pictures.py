@@ -358,12 +358,12 @@ def flow():
 
     left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/LanePath.cpp: take, prepare, load",
                                 "rules/Cut.h: segmentCount, windowStart"),
-                          ("A row for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
-                           "lanes/Transpose.h: loadRows"),
+                          ("A slice for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
+                           "lanes/Transpose.h: fillSlices"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
                            "lanes/Kernels.cpp: decode, runPasses"),
                           ("A pass, window by window", "lanes/Pass.h: runPass, forwardStep, backwardStep",
-                           "lanes/Rules.h: Greatest, Corrected", "lanes/Permute.h: Permutation"),
+                           "lanes/Rules.h: Greatest, Corrected", "lanes/Machine.h: Permutation"),
                           ("Decisions", "src/LanePath.cpp: decisions, ratios", "lanes/LaneDecoder.cpp: spread"))
     lanes.again(left[2] + 32, left[3] - 12, "2 x iterations")
 

@@ -1,15 +1,14 @@
 // InstructionSets: the compilations of the lanes, and which of them this machine can run.
 #include "InstructionSets.h"
 
-// One compilation of Kernels.cpp defines each.
-#define MORVIK_INSTRUCTION_SET(name, flags, isAvailable)   \
-    namespace lanes_##name                                 \
-    {                                                      \
-        extern const lanes::InstructionSet instructionSet; \
+namespace morvik::lanes {
+
+// Each compilation of Kernels.cpp defines one of these.
+#define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) \
+    namespace name {                                     \
+    extern const InstructionSet instructionSet;          \
     }
 #include "InstructionSets.def"
-
-namespace lanes {
 
 std::vector<const InstructionSet*> availableInstructionSets()
 {
@@ -19,7 +18,7 @@ std::vector<const InstructionSet*> availableInstructionSets()
 #endif
 #define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) \
     if (isAvailable) {                                   \
-        sets.push_back(&lanes_##name::instructionSet);   \
+        sets.push_back(&name::instructionSet);           \
     }
 #include "InstructionSets.def"
     return sets;
@@ -40,4 +39,4 @@ const Kernel& kernelFor(const InstructionSet& instructionSet, unsigned segments,
     return *kernel;
 }
 
-}  // namespace lanes
+}  // namespace morvik::lanes

@@ -6,7 +6,7 @@
 
 #include "Kernels.h"
 
-namespace lanes {
+namespace morvik::lanes {
 
 /// Those that this machine can run, the best one first. The last one runs everywhere.
 std::vector<const InstructionSet*> availableInstructionSets();
@@ -17,6 +17,6 @@ const InstructionSet& bestInstructionSet();
 /// The narrowest kernel that has room for all of `blocks` blocks of so many segments, or the widest one.
 const Kernel& kernelFor(const InstructionSet& instructionSet, unsigned segments, unsigned blocks);
 
-}  // namespace lanes
+}  // namespace morvik::lanes
 
 #endif

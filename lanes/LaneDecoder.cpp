@@ -11,14 +11,14 @@
 #include "rules/Schedule.h"
 #include "rules/Trellis.h"
 
-namespace lanes {
+namespace morvik::lanes {
 
 namespace {
 
 constexpr unsigned states = rules::stateCount;
 
-/// Hands out arrays from a stretch of memory, or adds up their size when there is none yet. Each begins
-/// on a cache line, at an offset that keeps equal steps of different arrays in different sets of the cache.
+/// Bump allocator; a null base only measures. Arrays begin on cache lines, staggered so that equal steps of different
+/// arrays lie in different sets of the cache.
 class Layout {
 public:
     static constexpr std::size_t line = 64;
@@ -44,27 +44,27 @@ private:
     std::size_t itsSize = 0;
 };
 
-RowPermutations takePermutations(const Kernel& kernel, Layout& layout, unsigned rows)
+SlicePermutations takePermutations(const Kernel& kernel, Layout& layout, unsigned steps)
 {
-    const std::size_t vectors = std::size_t{rows} * (kernel.lanes / kernel.vectorLanes);
-    return {rows,
+    const std::size_t vectors = std::size_t{steps} * (kernel.lanes / kernel.vectorLanes);
+    return {steps,
             layout.take<std::uint32_t>((vectors + fetchAhead) * kernel.sources),
             layout.take<std::uint8_t>(vectors * kernel.permutationBytes)};
 }
 
-bool loadRows(const Kernel& kernel, const std::int32_t* const* arrays, unsigned steps, std::int16_t* rows)
+bool fillSlices(const Kernel& kernel, const std::int32_t* const* arrays, unsigned steps, std::int16_t* slices)
 {
-    return kernel.loadWords(arrays, steps, rows);
+    return kernel.fillFromWords(arrays, steps, slices);
 }
 
-bool loadRows(const Kernel& kernel, const std::int16_t* const* arrays, unsigned steps, std::int16_t* rows)
+bool fillSlices(const Kernel& kernel, const std::int16_t* const* arrays, unsigned steps, std::int16_t* slices)
 {
-    return kernel.loadHalfWords(arrays, steps, rows);
+    return kernel.fillFromHalfWords(arrays, steps, slices);
 }
 
-bool loadRows(const Kernel& kernel, const std::int8_t* const* arrays, unsigned steps, std::int16_t* rows)
+bool fillSlices(const Kernel& kernel, const std::int8_t* const* arrays, unsigned steps, std::int16_t* slices)
 {
-    return kernel.loadBytes(arrays, steps, rows);
+    return kernel.fillFromBytes(arrays, steps, slices);
 }
 
 }  // namespace
@@ -129,8 +129,8 @@ void LaneDecoder::prepareWork(const Kernel& kernel, Work& work) const
 
 std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char* base) const
 {
-    const std::size_t row = kernel.lanes;
-    const std::size_t rows = steps() * row;
+    const std::size_t lanes = kernel.lanes;
+    const std::size_t values = steps() * lanes;
     const unsigned windows = itsCut.rows();
     Layout layout(base);
     Workspace& space = work.space;
@@ -139,48 +139,51 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
     space.corrections = itsCorrections.data();
     for (const unsigned d : {0U, 1U}) {
         work.interleaver[d] = takePermutations(kernel, layout, steps());
-        space.constituent[d] = {layout.take<std::int16_t>(rows),
-                                layout.take<std::int16_t>(rows),
-                                layout.take<std::int16_t>(rows),
+        space.constituent[d] = {layout.take<std::int16_t>(values),
+                                layout.take<std::int16_t>(values),
+                                layout.take<std::int16_t>(values),
                                 {work.interleaver[d].sources, work.interleaver[d].controls},
-                                layout.take<std::int16_t>(states * row),
-                                layout.take<std::int16_t>(std::size_t{windows} * states * row),
-                                layout.take<std::int16_t>(states * row),
-                                layout.take<std::int16_t>(states * row)};
+                                layout.take<std::int16_t>(states * lanes),
+                                layout.take<std::int16_t>(std::size_t{windows} * states * lanes),
+                                layout.take<std::int16_t>(states * lanes),
+                                layout.take<std::int16_t>(states * lanes)};
     }
     work.before = takePermutations(kernel, layout, 1);
     work.after = takePermutations(kernel, layout, 1);
     space.before = {work.before.sources, work.before.controls};
     space.after = {work.after.sources, work.after.controls};
-    space.firstLanes = work.firstLanes = layout.take<std::int16_t>(row);
-    space.lastLanes = work.lastLanes = layout.take<std::int16_t>(row);
+    space.firstLanes = work.firstLanes = layout.take<std::int16_t>(lanes);
+    space.lastLanes = work.lastLanes = layout.take<std::int16_t>(lanes);
     space.slots = layout.take<std::int16_t>(std::size_t{longestWindow} * kernel.slotBytes / 2);
     space.forward = layout.take<std::int16_t>(kernel.forwardBytes / 2);
-    space.ratios = layout.take<std::int16_t>(rows);
+    space.ratios = layout.take<std::int16_t>(values);
     return layout.size();
 }
 
-/// The interleaver is contention-free: the positions that one step of all segments takes its values from
-/// are one step of all segments in the other order, too.
+/// The interleaver is contention-free: it takes the values of one step of all segments from one step of all segments in
+/// the other order.
 void LaneDecoder::prepareInterleaver(const Kernel& kernel,
-                                     const RowPermutations& rows,
+                                     const SlicePermutations& permutations,
                                      const std::vector<unsigned>& from) const
 {
     for (unsigned k = 0; k < steps(); ++k) {
-        const unsigned sourceRow = from[k] % steps();
-        preparePermutation(kernel, rows, k, sourceRow, [&](unsigned segment) {
-            return (from[k + segment * steps()] - sourceRow) / steps();
+        const unsigned sourceStep = from[k] % steps();
+        preparePermutation(kernel, permutations, k, sourceStep, [&](unsigned segment) {
+            return (from[k + segment * steps()] - sourceStep) / steps();
         });
     }
     const std::size_t vectors = kernel.lanes / kernel.vectorLanes;
-    std::fill_n(rows.sources + rows.count * vectors * kernel.sources, fetchAhead * kernel.sources, 0U);
+    std::fill_n(permutations.sources + permutations.count * vectors * kernel.sources, fetchAhead * kernel.sources, 0U);
 }
 
-/// Row `row` takes its values from row `sourceRow`, each segment from segment sourceOf(segment), modulo the
-/// number of segments.
+/// The slice of a step takes its values from that of `sourceStep`, each segment from segment sourceOf(segment), modulo
+/// the number of segments.
 template <class SourceOf>
-void LaneDecoder::preparePermutation(
-    const Kernel& kernel, const RowPermutations& rows, unsigned row, unsigned sourceRow, SourceOf sourceOf) const
+void LaneDecoder::preparePermutation(const Kernel& kernel,
+                                     const SlicePermutations& permutations,
+                                     unsigned step,
+                                     unsigned sourceStep,
+                                     SourceOf sourceOf) const
 {
     const LaneOrder order = laneOrder(kernel);
     const auto sourceLane = [&](unsigned lane) {
@@ -188,17 +191,17 @@ void LaneDecoder::preparePermutation(
     };
     const unsigned vectorLanes = kernel.vectorLanes;
     for (unsigned v = 0; v < kernel.lanes / vectorLanes; ++v) {
-        const std::size_t at = v * rows.count + row;
+        const std::size_t at = v * permutations.count + step;
         std::uint8_t withinGroup[mostLanes] = {};
         for (unsigned lane = 0; lane < vectorLanes; ++lane) {
             withinGroup[lane] = static_cast<std::uint8_t>(sourceLane(v * vectorLanes + lane) % kernel.groupLanes);
         }
-        kernel.prepare(withinGroup, rows.controls + at * kernel.permutationBytes);
+        kernel.prepare(withinGroup, permutations.controls + at * kernel.permutationBytes);
         for (unsigned i = 0; i < kernel.sources; ++i) {
             const unsigned lane = sourceLane(v * vectorLanes + i * kernel.groupLanes);
             const unsigned group = lane - lane % kernel.groupLanes;
-            rows.sources[at * kernel.sources + i] =
-                (group / vectorLanes * rows.count + sourceRow) * vectorLanes + group % vectorLanes;
+            permutations.sources[at * kernel.sources + i] =
+                (group / vectorLanes * permutations.count + sourceStep) * vectorLanes + group % vectorLanes;
         }
     }
 }
@@ -221,10 +224,10 @@ bool LaneDecoder::load(const Streams<Input>* blocks, unsigned count)
     itsCurrent = &work;
     itsBlocks = blocksTaken(count);
     work.space.windowStart = itsWindowStart.data();  // of the cut as it is now
-    ConstituentRows* const rows = work.space.constituent;
-    bool within = loadStream(blocks, &Streams<Input>::systematic, 0, rows[0].systematic);
-    within = loadStream(blocks, &Streams<Input>::parity1, 1, rows[0].parity) && within;
-    return loadStream(blocks, &Streams<Input>::parity2, 2, rows[1].parity) && within;
+    Constituent* const constituents = work.space.constituent;
+    bool within = fillStream(blocks, &Streams<Input>::systematic, 0, constituents[0].systematic);
+    within = fillStream(blocks, &Streams<Input>::parity1, 1, constituents[0].parity) && within;
+    return fillStream(blocks, &Streams<Input>::parity2, 2, constituents[1].parity) && within;
 }
 
 template bool LaneDecoder::load(const Streams<std::int32_t>*, unsigned);
@@ -232,17 +235,17 @@ template bool LaneDecoder::load(const Streams<std::int16_t>*, unsigned);
 template bool LaneDecoder::load(const Streams<std::int8_t>*, unsigned);
 
 template <class Input>
-bool LaneDecoder::loadStream(const Streams<Input>* blocks,
+bool LaneDecoder::fillStream(const Streams<Input>* blocks,
                              const Input* Streams<Input>::*stream,
                              unsigned s,
-                             std::int16_t* rows)
+                             std::int16_t* slices)
 {
     const Input* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
         const LaneStart& start = itsCurrent->laneStart[lane];
         lanes[lane] = blocks[presentBlock(start.block)].*stream + start.position;
     }
-    bool within = loadRows(*itsKernel, lanes, steps(), rows);
+    bool within = fillSlices(*itsKernel, lanes, steps(), slices);
     for (unsigned block = 0; block < itsBlocks; ++block) {
         for (unsigned position = 0; position < tailPositions; ++position) {
             const auto value = int{valueAt(blocks[block].*stream, std::size_t{itsCut.K()} + position)};
@@ -253,7 +256,7 @@ bool LaneDecoder::loadStream(const Streams<Input>* blocks,
     return within;
 }
 
-/// Lanes without a block repeat the last one, so that their metrics stay within bounds, too.
+/// Lanes without a block repeat the last one, which keeps their metrics within bounds.
 unsigned LaneDecoder::presentBlock(unsigned block) const
 {
     return std::min(block, itsBlocks - 1);
@@ -269,18 +272,18 @@ void LaneDecoder::decode(unsigned from, unsigned to)
     itsLastDecoder = rules::constituentOf(to - 1);
 }
 
-/// Before the first passes the state is known at a block's ends alone (rules 10, 19, 20).
+/// Before the first passes the state is known only at a block's ends (rules 10, 19, 20).
 void LaneDecoder::prepareStarts(unsigned d)
 {
     const Workspace& space = itsCurrent->space;
-    const std::size_t row = itsKernel->lanes;
+    const std::size_t lanes = itsKernel->lanes;
     std::int16_t* const alpha = space.constituent[d].alphaStart;
     std::int16_t* const beta = space.constituent[d].betaStart;
-    std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * row;
-    std::fill_n(alpha, states * row, std::int16_t{0});
-    std::fill(beta, lastBeta + states * row, std::int16_t{0});
-    std::fill_n(space.constituent[d].alphaReached, states * row, std::int16_t{0});
-    std::fill_n(space.constituent[d].betaReached, states * row, std::int16_t{0});
+    std::int16_t* const lastBeta = beta + std::size_t{space.windows - 1} * states * lanes;
+    std::fill_n(alpha, states * lanes, std::int16_t{0});
+    std::fill(beta, lastBeta + states * lanes, std::int16_t{0});
+    std::fill_n(space.constituent[d].alphaReached, states * lanes, std::int16_t{0});
+    std::fill_n(space.constituent[d].betaReached, states * lanes, std::int16_t{0});
     const LaneOrder order = laneOrder(*itsKernel);
     for (unsigned block = 0; block < itsKernel->lanes / itsCut.segments(); ++block) {
         const unsigned first = order.lane(block, 0);
@@ -293,39 +296,39 @@ void LaneDecoder::prepareStarts(unsigned d)
         }
         const auto metrics = rules::tailColumn(tail);
         for (unsigned state = 0; state < states; ++state) {
-            alpha[state * row + first] = state == 0 ? 0 : unlikely;
-            lastBeta[state * row + last] = static_cast<std::int16_t>(metrics[state] & borderMask);
+            alpha[state * lanes + first] = state == 0 ? 0 : unlikely;
+            lastBeta[state * lanes + last] = static_cast<std::int16_t>(metrics[state] & borderMask);
         }
     }
 }
 
 template <class Output>
-void LaneDecoder::spread(void (*store)(const std::int16_t*, unsigned, Output* const*),
-                         const std::int16_t* rows,
+void LaneDecoder::spread(void (*spreadSlices)(const std::int16_t*, unsigned, Output* const*),
+                         const std::int16_t* slices,
                          Output* const* blocks)
 {
-    Output scratch[mostSteps];  // what the lanes without a block give
+    Output scratch[mostSteps];  // for lanes without a block
     Output* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
         const LaneStart& start = itsCurrent->laneStart[lane];
         lanes[lane] = start.block < itsBlocks ? blocks[start.block] + start.position : scratch;
     }
-    store(rows, steps(), lanes);
+    spreadSlices(slices, steps(), lanes);
 }
 
 void LaneDecoder::decisions(std::uint8_t* const* blocks)
 {
-    spread(itsKernel->storeDecisions, itsCurrent->space.ratios, blocks);
+    spread(itsKernel->spreadDecisions, itsCurrent->space.ratios, blocks);
 }
 
 void LaneDecoder::ratios(std::int16_t* const* blocks)
 {
-    spread(itsKernel->storeRatios, itsCurrent->space.ratios, blocks);
+    spread(itsKernel->spreadWords, itsCurrent->space.ratios, blocks);
 }
 
 void LaneDecoder::joint(std::int16_t* const* blocks)
 {
-    spread(itsKernel->storeRatios, itsCurrent->space.constituent[itsLastDecoder].joint, blocks);
+    spread(itsKernel->spreadWords, itsCurrent->space.constituent[itsLastDecoder].joint, blocks);
 }
 
 LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
@@ -333,8 +336,8 @@ LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
     const LaneOrder order = laneOrder(*itsKernel);
     const unsigned vectorLanes = itsKernel->vectorLanes;
     LoadedBlock streams;
-    const ConstituentRows* const rows = itsCurrent->space.constituent;
-    const std::int16_t* const sources[3] = {rows[0].systematic, rows[0].parity, rows[1].parity};
+    const Constituent* const constituents = itsCurrent->space.constituent;
+    const std::int16_t* const sources[3] = {constituents[0].systematic, constituents[0].parity, constituents[1].parity};
     for (unsigned s = 0; s < 3; ++s) {
         std::vector<std::int16_t>& values = streams[s];
         values.reserve(itsCut.K() + tailPositions);
@@ -351,4 +354,4 @@ LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
     return streams;
 }
 
-}  // namespace lanes
+}  // namespace morvik::lanes

@@ -13,9 +13,7 @@
 #include "rules/Cut.h"
 #include "rules/Tail.h"
 
-namespace lanes {
-
-namespace rules = morvik::rules;
+namespace morvik::lanes {
 
 using rules::Cut;
 using rules::tailPositions;
@@ -31,13 +29,13 @@ struct Streams {
 /// The three streams of a block as they were loaded.
 using LoadedBlock = std::array<std::vector<std::int16_t>, 3>;
 
-/// The correction table: steps, by a quarter of the difference's magnitude in steps; its last entry also
-/// serves all greater ones.
+/// The correction table: eighths, by a quarter of the difference's magnitude in eighths; the last entry serves all
+/// greater ones, too.
 using CorrectionTable = std::array<std::uint8_t, 16>;
 
 /// Permutations (Workspace.h) while they are prepared.
-struct RowPermutations {
-    unsigned count;  ///< of rows
+struct SlicePermutations {
+    unsigned count;  ///< of slices
     std::uint32_t* sources;
     std::uint8_t* controls;
 };
@@ -64,18 +62,18 @@ public:
     /// How many blocks the next load takes when there are `blocks`, 1 or more.
     unsigned blocksTaken(unsigned blocks) const;
 
-    /// Takes in as many blocks as blocksTaken says. False when a value was beyond the input format: the
-    /// blocks have to be loaded again, clipped. Exhausted memory throws std::bad_alloc.
+    /// Takes as many blocks as blocksTaken says. False when a value is beyond the input format: clip the blocks and
+    /// load them again. Throws std::bad_alloc.
     template <class Input>
     bool load(const Streams<Input>* blocks, unsigned count);
 
-    /// Runs passes `from` to `to` - 1 on the blocks that were loaded: 0 is the first one, later ones go on where
-    /// the last call ended.
+    /// Runs passes `from` to `to` - 1 on the loaded blocks: 0 is the first one, later ones go on where the last call
+    /// ended.
     void decode(unsigned from, unsigned to);
 
-    /// The results of the last pass, an array of K values for each block, in the order of the pass's
-    /// constituent decoder: decisions, 0 or 1; ratios, aligned words; and what goes to the next pass, aligned
-    /// words: half of the extrinsic value, rounded down to a step, plus the systematic value.
+    /// The results of the last pass, an array of K values for each block, in the order of the pass's constituent
+    /// decoder: decisions, 0 or 1; ratios, aligned words; what goes to the next pass, aligned words: half of the
+    /// extrinsic value, rounded down to an eighth, plus the systematic value.
     void decisions(std::uint8_t* const* blocks);
     void ratios(std::int16_t* const* blocks);
     void joint(std::int16_t* const* blocks);
@@ -101,9 +99,9 @@ private:
         unsigned blockSize = 0;  ///< 0: none
         std::vector<unsigned char> storage;
         LaneStart laneStart[mostLanes] = {};
-        RowPermutations interleaver[2] = {};
-        RowPermutations before = {};
-        RowPermutations after = {};
+        SlicePermutations interleaver[2] = {};
+        SlicePermutations before = {};
+        SlicePermutations after = {};
         std::int16_t* firstLanes = nullptr;
         std::int16_t* lastLanes = nullptr;
         Workspace space = {};
@@ -114,18 +112,26 @@ private:
     unsigned presentBlock(unsigned block) const;
     void prepareWork(const Kernel& kernel, Work& work) const;
     std::size_t layOut(const Kernel& kernel, Work& work, unsigned char* base) const;
-    void prepareInterleaver(const Kernel& kernel, const RowPermutations& rows, const std::vector<unsigned>& from) const;
+    void prepareInterleaver(const Kernel& kernel,
+                            const SlicePermutations& permutations,
+                            const std::vector<unsigned>& from) const;
     template <class SourceOf>
-    void preparePermutation(
-        const Kernel& kernel, const RowPermutations& rows, unsigned row, unsigned sourceRow, SourceOf sourceOf) const;
+    void preparePermutation(const Kernel& kernel,
+                            const SlicePermutations& permutations,
+                            unsigned step,
+                            unsigned sourceStep,
+                            SourceOf sourceOf) const;
     void prepareStarts(unsigned d);
 
     template <class Input>
-    bool loadStream(const Streams<Input>* blocks, const Input* Streams<Input>::*stream, unsigned s, std::int16_t* rows);
+    bool fillStream(const Streams<Input>* blocks,
+                    const Input* Streams<Input>::*stream,
+                    unsigned s,
+                    std::int16_t* slices);
 
     template <class Output>
-    void spread(void (*store)(const std::int16_t*, unsigned, Output* const*),
-                const std::int16_t* rows,
+    void spread(void (*spreadSlices)(const std::int16_t*, unsigned, Output* const*),
+                const std::int16_t* slices,
                 Output* const* blocks);
 
     const InstructionSet& itsInstructionSet;
@@ -143,6 +149,6 @@ private:
     std::vector<TailValues> itsTails;
 };
 
-}  // namespace lanes
+}  // namespace morvik::lanes
 
 #endif

@@ -1,18 +1,18 @@
-// LaneOrder: which segment of which block stands in which lane of a row.
+// LaneOrder: which lane works on which segment of which block.
 #ifndef MORVIK_LANES_LANEORDER_H
 #define MORVIK_LANES_LANEORDER_H
 
 #include <algorithm>
 
-namespace lanes {
+namespace morvik::lanes {
 
-/// Blocks of `segments` segments, a power of two, share the vectors of a row, whose lanes form groups of
-/// `groupLanes`. A block of no more segments than that takes as many neighbouring lanes, in order. A larger one
-/// takes q whole groups and deals its segments out to them in turn: a group holds the segments that are equal
-/// modulo q, and a vector of several groups those that are equal modulo the number of the block's vectors. So
-/// whatever the step, the interleaver takes the values of a group from one group, and those of a vector from one
-/// vector: over the segments u of a step it is a quadratic permutation polynomial, c + a u + d u^2 with an odd a
-/// and an even d, and what such a polynomial gives modulo a power of two depends on u modulo that power alone.
+/// Blocks of `segments` segments, a power of two, share the lanes of a slice, in groups of `groupLanes`. A block of no
+/// more segments than a group takes as many neighbouring lanes, in order. A larger one takes q whole groups and deals
+/// its segments out to them in turn: a group holds the segments that are equal modulo q, and a vector of several groups
+/// those that are equal modulo the number of the block's vectors. So the interleaver takes, at any step, the values of
+/// a group from one group, and those of a vector from one vector: over the segments u of a step it is a quadratic
+/// permutation polynomial, c + a u + d u^2 with an odd a and an even d, whose value modulo a power of two depends on u
+/// modulo that power alone.
 class LaneOrder {
 public:
     LaneOrder(unsigned segments, unsigned groupLanes, unsigned vectorLanes)
@@ -51,6 +51,6 @@ private:
     unsigned itsVectors;  ///< of a block, 1 if it is a part of one
 };
 
-}  // namespace lanes
+}  // namespace morvik::lanes
 
 #endif

@@ -1,32 +1,38 @@
-// Pass: one soft-in/soft-out pass of a constituent decoder, for all lanes of a row at once.
+// Pass: one soft-in/soft-out pass of a constituent decoder, in all lanes at once.
 #ifndef MORVIK_LANES_PASS_H
 #define MORVIK_LANES_PASS_H
 
 #include <cstddef>
 
 #include "Bounds.h"
-#include "Permute.h"
+#include "Machine.h"
 #include "Rules.h"
 #include "Words.h"
 #include "Workspace.h"
 #include "rules/Trellis.h"
 
-namespace MORVIK_LANES {
+namespace morvik::lanes::MORVIK_LANES {
 
-/// A pass over rows of `vectors` vectors of `count` lanes. The windows of a segment are worked on in turn, each of
-/// them in every lane: the forward recursion leaves its metrics in slots, one for each step; the backward recursion
-/// takes them up and goes on to ratios and joint values. `scaled` says whether extrinsic values are taken times 0.75.
+/// Whether extrinsic values go on as they are, or times 0.75.
+enum class Extrinsic { whole, scaled };
+
+/// Whether a pass keeps its ratios, as the last one does.
+enum class Ratios { dropped, kept };
+
+/// A pass over slices of `vectors` vectors of `count` lanes. All lanes work on the same window of their segments. The
+/// forward recursion leaves its metrics in slots, one for each step; the backward recursion reads them and computes
+/// ratios and joint values.
 ///
-/// The backward recursion starts anew in each window, so that `abreast` windows of equal length can go side by
-/// side in one wider vector, where a vector of `count` lanes would leave a part of the machine idle.
-template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, bool scaled>
+/// The backward recursion starts anew in each window. So `abreast` windows of equal length can go side by side in a
+/// wider vector, where a vector of `count` lanes would leave part of the machine idle.
+template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, Extrinsic extrinsic>
 class Pass {
     static constexpr unsigned states = rules::stateCount;
-    static constexpr unsigned row = vectors * count;
+    static constexpr unsigned lanesOfSlice = vectors * count;
     static constexpr unsigned wide = abreast * count;
-    using Value = Steps<count>;
-    using WideValue = Steps<wide>;
-    using Lanes = Permutation<count>;
+    using Value = Eighths<count>;
+    using WideValue = Eighths<wide>;
+    using Permutation = Machine::Permutation<count>;
     using Rule = RuleOf<count>;
     using WideRule = RuleOf<wide>;
     using Decision = typename Rule::Decision;
@@ -45,15 +51,15 @@ public:
     static constexpr unsigned slotBytes = 2 * slotWords;
     static constexpr unsigned forwardBytes = vectors * static_cast<unsigned>(sizeof(Column));
 
-    MORVIK_INLINE Pass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint)
+    MORVIK_INLINE Pass(const Workspace& workspace, unsigned d, const std::int16_t* joint)
         : w(workspace),
-          itsRows(workspace.constituent[d]),
+          itsConstituent(workspace.constituent[d]),
           itsSteps(w.steps),
           itsSource(joint),
-          itsInterleaver(itsRows.interleaver),
-          itsParity(itsRows.parity),
-          itsSystematic(itsRows.systematic),
-          itsJoint(itsRows.joint),
+          itsInterleaver(itsConstituent.interleaver),
+          itsParity(itsConstituent.parity),
+          itsSystematic(itsConstituent.systematic),
+          itsJoint(itsConstituent.joint),
           itsRatios(w.ratios),
           itsSlots(w.slots),
           itsRule(workspace.corrections),
@@ -61,19 +67,19 @@ public:
     {
     }
 
-    /// `first`: this is the decoder's first pass of the block. `last`: ratios are kept.
-    template <bool last>
-    MORVIK_INLINE void run(bool first) const
+    /// `isFirst`: this is the decoder's first pass over the block.
+    template <Ratios ratios>
+    MORVIK_INLINE void run(bool isFirst) const
     {
-        // The last row starts from what the first row reached: in this pass, when there is a row between
-        // them in which the hardware can hand it on (rule 20), else in the pass before.
-        const bool handedWithin = !first && w.windows > 2;
-        hand(itsRows.alphaReached, w.before, itsRows.alphaStart, w.firstLanes);
+        // The last window starts from what the first one of the next segment reached: in this pass when a window lies
+        // between them, in which the hardware hands it on (rule 20), otherwise in the pass before.
+        const bool handedWithin = !isFirst && w.windows > 2;
+        hand(itsConstituent.alphaReached, w.before, itsConstituent.alphaStart, w.firstLanes);
         if (!handedWithin) {
             handBack();
         }
         for (unsigned v = 0; v < vectors; ++v) {
-            saveForward(v, load(itsRows.alphaStart + v * count));
+            saveForward(v, columnAt(itsConstituent.alphaStart + v * count));
         }
         Windows windows = windowsFrom(0, 0, 0, slotWords);
         runForward(windows);
@@ -82,18 +88,18 @@ public:
                 handBack();
             }
             const Windows next = following(windows);
-            runWindows<last>(windows, next);
+            runWindows<ratios>(windows, next);
             windows = next;
         }
         for (unsigned v = 0; v < vectors; ++v) {
-            storeBorder(restoreForward(v), itsRows.alphaReached + v * count);
+            storeBorder(restoreForward(v), itsConstituent.alphaReached + v * count);
         }
     }
 
 private:
-    /// Windows of one vector's lanes that go abreast; the last ones are all the same one where no other is as
-    /// long. Their slots follow each other upwards and downwards in turn: the forward recursion of a window fills
-    /// the slots that the backward recursion of the one before frees.
+    /// Windows of one vector's lanes that go abreast; the last one repeats where no other is as long. Their slots
+    /// follow each other upwards and downwards in turn: the forward recursion of a window fills the slots that the
+    /// backward recursion of the one before frees.
     struct Windows {
         unsigned r[abreast];
         unsigned v;
@@ -151,21 +157,21 @@ private:
         saveForward(windows.v, a);
     }
 
-    /// The backward recursion of windows, together with the forward recursion of the next ones: two
-    /// independent chains keep the processor's units busy where its registers suffice for both.
-    template <bool last>
+    /// The backward recursion of windows, together with the forward recursion of the next ones where registers suffice
+    /// for both: two independent chains keep the processor's units busy.
+    template <Ratios ratios>
     MORVIK_INLINE void runWindows(const Windows& windows, const Windows& next) const
     {
-        WideColumn b = loadStart(windows);
+        WideColumn b = startColumn(windows);
         if constexpr (overlapped) {
             if (next.length != 0) {
                 Column a = restoreForward(next.v);
-                both<last>(windows, b, next, a);
+                both<ratios>(windows, b, next, a);
                 saveForward(next.v, broughtBack<Decision>(a));
             }
-            backward<last>(windows, windows.length - next.length, b);
+            backward<ratios>(windows, windows.length - next.length, b);
         } else {
-            backward<last>(windows, windows.length, b);
+            backward<ratios>(windows, windows.length, b);
             if (next.length != 0) {
                 runForward(next);
             }
@@ -173,11 +179,7 @@ private:
         storeReached(windows, b);
     }
 
-#if defined(__AVX512VL__) && defined(__x86_64__)
-    static constexpr bool overlapped = Rule::fewRegisters && abreast == 1;
-#else
-    static constexpr bool overlapped = false;
-#endif
+    static constexpr bool overlapped = Machine::holdsTwoRecursions && Rule::fewRegisters && abreast == 1;
 
     MORVIK_INLINE void forward(const Windows& windows, unsigned j, Column& a) const
     {
@@ -189,38 +191,38 @@ private:
     }
 
     /// The first `steps` steps of the windows.
-    template <bool last>
+    template <Ratios ratios>
     MORVIK_INLINE void backward(const Windows& windows, unsigned steps, WideColumn& b) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(steps);
         for (std::size_t i = steps; i-- > 0;) {
             slot -= windows.direction;
-            backwardStep<last>(windows, i, slot, b);
+            backwardStep<ratios>(windows, i, slot, b);
         }
     }
 
-    /// As many backward steps of the windows as the next one, which is no longer, has forward steps.
-    template <bool last>
+    /// All forward steps of the next window, which is no longer, and as many backward steps of the windows.
+    template <Ratios ratios>
     MORVIK_INLINE void both(const Windows& windows, WideColumn& b, const Windows& next, Column& a) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
         std::int16_t* nextSlot = itsSlots + next.slot;
         for (std::size_t i = 0; i < next.length; ++i) {
             slot -= windows.direction;
-            backwardStep<last>(windows, windows.length - 1 - i, slot, b);
+            backwardStep<ratios>(windows, windows.length - 1 - i, slot, b);
             forwardStep(at(next, 0, i), nextSlot, a);
             nextSlot += next.direction;
         }
     }
 
-    /// Step `i` of all vectors' steps, into the window's lanes of a slot.
+    /// Step `i` of all vectors' steps. `slot` begins at the window's lanes.
     MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a) const
     {
-        const std::uint32_t* const sources = itsInterleaver.sources + i * Lanes::sources;
-        __builtin_prefetch(itsSource + sources[lanes::fetchAhead * Lanes::sources]);
-        const Value joint = Lanes::load(itsSource, sources, itsInterleaver.controls + i * Lanes::bytes);
-        StepsBranches<count> g = rules::branchSums(joint, Value::load(itsParity + i * count), Value{});
-        rules::clipBranches(g, lanes::branchMin, lanes::branchMax);
+        const std::uint32_t* const sources = itsInterleaver.sources + i * Permutation::sources;
+        __builtin_prefetch(itsSource + sources[fetchAhead * Permutation::sources]);
+        const Value joint = Permutation::gather(itsSource, sources, itsInterleaver.controls + i * Permutation::bytes);
+        BranchMetrics<count> g = rules::branchSums(joint, Value::load(itsParity + i * count), Value{});
+        rules::clipBranches(g, branchMin, branchMax);
         rules::forEach<states>([&](auto state)
                                    MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * wide); });
         g[0].store(slot + slotBranches);
@@ -229,7 +231,7 @@ private:
         a = rules::forwardStep(itsRule.decision(), a, g);
     }
 
-    template <bool last>
+    template <Ratios ratios>
     MORVIK_INLINE void backwardStep(const Windows& windows,
                                     std::size_t i,
                                     const std::int16_t* slot,
@@ -238,20 +240,20 @@ private:
         const WideValue g0 = WideValue::load(slot + slotBranches);
         const WideValue g1 = WideValue::load(slot + slotBranches + wide);
         const WideValue ratio = itsWideRule.stepBack({slot}, b, {g0, g1, g1, g0});
-        if constexpr (last) {
-            storeStep(windows, i, ratio, itsRatios);
+        if constexpr (ratios == Ratios::kept) {
+            storeValues(windows, i, ratio, itsRatios);
         }
         const WideValue joint = WideValue::load(slot + slotJoint);
-        storeStep(windows, i, nextJoint(ratio, joint, loadStep(windows, i, itsSystematic)), itsJoint);
+        storeValues(windows, i, nextJoint(ratio, joint, valuesAt(windows, i, itsSystematic)), itsJoint);
     }
 
-    /// The extrinsic value x = ratio - 2 joint is scaled, rounded down to a step and clipped (rule 14), and
-    /// enters the other decoder halved, again rounded down (rule 13): all roundings fall into one.
+    /// The extrinsic value x = ratio - 2 joint is scaled, rounded down and clipped (rule 14), and enters the other
+    /// decoder halved and rounded down (rule 13): one rounding does for all.
     static MORVIK_INLINE WideValue nextJoint(WideValue ratio, WideValue joint, WideValue systematic)
     {
         const WideValue x = ratio - (joint + joint);
-        const WideValue half = scaled ? threeEighths(x) : x >> 1;
-        return clip(half, lanes::branchMin / 2, lanes::branchMax / 2) + systematic;
+        const WideValue half = extrinsic == Extrinsic::scaled ? Machine::scaledHalf(x) : x >> 1;
+        return clip(half, branchMin / 2, branchMax / 2) + systematic;
     }
 
     /// Step `i` of window `j` among the steps of all vectors.
@@ -260,40 +262,42 @@ private:
         return std::size_t{windows.v} * itsSteps + windows.from[j] + i;
     }
 
-    MORVIK_INLINE WideValue loadStep(const Windows& windows, std::size_t i, const std::int16_t* rows) const
+    MORVIK_INLINE WideValue valuesAt(const Windows& windows, std::size_t i, const std::int16_t* slices) const
     {
-        const Value first = Value::load(rows + at(windows, 0, i) * count);
+        const Value first = Value::load(slices + at(windows, 0, i) * count);
         if constexpr (abreast == 1) {
             return first;
         } else {
-            return join(first, Value::load(rows + at(windows, 1, i) * count));
+            return join(first, Value::load(slices + at(windows, 1, i) * count));
         }
     }
 
-    MORVIK_INLINE void storeStep(const Windows& windows, std::size_t i, WideValue value, std::int16_t* rows) const
+    MORVIK_INLINE void storeValues(const Windows& windows, std::size_t i, WideValue value, std::int16_t* slices) const
     {
         rules::forEach<abreast>(
-            [&](auto j) MORVIK_INLINE_LAMBDA { part<count, j>(value).store(rows + at(windows, j, i) * count); });
+            [&](auto j) MORVIK_INLINE_LAMBDA { part<count, j>(value).store(slices + at(windows, j, i) * count); });
     }
 
-    static MORVIK_INLINE Column load(const std::int16_t* column)
+    static MORVIK_INLINE Column columnAt(const std::int16_t* column)
     {
         Column m{};
-        rules::forEach<states>(
-            [&](auto state) MORVIK_INLINE_LAMBDA { m[state] = Decision::metric(Value::load(column + state * row)); });
+        rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
+            m[state] = Decision::metric(Value::load(column + state * lanesOfSlice));
+        });
         return m;
     }
 
-    MORVIK_INLINE WideColumn loadStart(const Windows& windows) const
+    MORVIK_INLINE WideColumn startColumn(const Windows& windows) const
     {
         WideColumn m{};
         rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
-            const std::int16_t* const metrics = itsRows.betaStart + state * row + windows.v * count;
-            const Value first = Value::load(metrics + windows.r[0] * states * row);
+            const std::int16_t* const metrics = itsConstituent.betaStart + state * lanesOfSlice + windows.v * count;
+            const Value first = Value::load(metrics + windows.r[0] * states * lanesOfSlice);
             if constexpr (abreast == 1) {
                 m[state] = WideDecision::metric(first);
             } else {
-                m[state] = WideDecision::metric(join(first, Value::load(metrics + windows.r[1] * states * row)));
+                m[state] =
+                    WideDecision::metric(join(first, Value::load(metrics + windows.r[1] * states * lanesOfSlice)));
             }
         });
         return m;
@@ -311,12 +315,12 @@ private:
         return a;
     }
 
-    /// A column with state 0 near 0, by a shift that border columns do not notice (Bounds.h).
+    /// The column shifted so that state 0 is near 0, which changes no border column (Bounds.h).
     template <class AnyDecision>
     static MORVIK_INLINE rules::Column<AnyDecision> broughtBack(rules::Column<AnyDecision> m)
     {
         const auto level = AnyDecision::stored(m[0]);
-        const auto kept = level & level.of(lanes::borderMask);
+        const auto kept = level & level.of(borderMask);
         rules::forEach<states>([&](auto state)
                                    MORVIK_INLINE_LAMBDA { m[state] = AnyDecision::subtract(m[state], kept); });
         return m;
@@ -326,18 +330,19 @@ private:
     static MORVIK_INLINE void storeBorder(const Column& m, std::int16_t* column)
     {
         rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
-            (Decision::stored(m[state]) & Value::of(lanes::borderMask)).store(column + state * row);
+            (Decision::stored(m[state]) & Value::of(borderMask)).store(column + state * lanesOfSlice);
         });
     }
 
-    /// The column that a window reached is where the window before it starts next time; the first one's
-    /// belongs to the segment before, to its last window.
+    /// Where a window ends, the window before it starts next time; before the first one, the last window of the segment
+    /// before.
     MORVIK_INLINE void storeReached(const Windows& windows, const WideColumn& b) const
     {
         const WideColumn m = broughtBack<WideDecision>(b);
         rules::forEach<abreast>([&](auto j) MORVIK_INLINE_LAMBDA {
             const unsigned r = windows.r[j];
-            std::int16_t* const column = r == 0 ? itsRows.betaReached : itsRows.betaStart + (r - 1) * states * row;
+            std::int16_t* const column =
+                r == 0 ? itsConstituent.betaReached : itsConstituent.betaStart + (r - 1) * states * lanesOfSlice;
             Column reached{};
             rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
                 reached[state] = Decision::metric(part<count, j>(WideDecision::stored(m[state])));
@@ -348,32 +353,36 @@ private:
 
     MORVIK_INLINE void handBack() const
     {
-        hand(itsRows.betaReached, w.after, itsRows.betaStart + (w.windows - 1) * states * row, w.lastLanes);
+        hand(itsConstituent.betaReached,
+             w.after,
+             itsConstituent.betaStart + (w.windows - 1) * states * lanesOfSlice,
+             w.lastLanes);
     }
 
-    /// Columns move to a neighbouring segment's lane, but for the segments at a block's border, which keep theirs.
+    /// Columns move to a neighbouring segment's lane; segments at a block's border keep theirs.
     MORVIK_INLINE void hand(const std::int16_t* columns,
-                            const lanes::Permutations& from,
+                            const Permutations& from,
                             std::int16_t* to,
                             const std::int16_t* keep) const
     {
         for (unsigned state = 0; state < states; ++state) {
             for (unsigned v = 0; v < vectors; ++v) {
-                const Value moved = Lanes::load(
-                    columns + state * row, from.sources + v * Lanes::sources, from.controls + v * Lanes::bytes);
-                std::int16_t* start = to + state * row + v * count;
+                const Value moved = Permutation::gather(columns + state * lanesOfSlice,
+                                                        from.sources + v * Permutation::sources,
+                                                        from.controls + v * Permutation::bytes);
+                std::int16_t* start = to + state * lanesOfSlice + v * count;
                 blend(Value::load(keep + v * count), moved, Value::load(start)).store(start);
             }
         }
     }
 
-    const lanes::Workspace& w;
-    const lanes::ConstituentRows& itsRows;
+    const Workspace& w;
+    const Constituent& itsConstituent;
 
-    // What every step uses, at hand: stores of values might change what is behind a reference.
+    // Copies for every step: stores of values might change what is behind a reference.
     const unsigned itsSteps;
     const std::int16_t* const itsSource;  ///< joint values of the other decoder
-    const lanes::Permutations itsInterleaver;
+    const Permutations itsInterleaver;
     const std::int16_t* const itsParity;
     const std::int16_t* const itsSystematic;
     std::int16_t* const itsJoint;
@@ -383,12 +392,17 @@ private:
     const WideRule itsWideRule;
 };
 
-template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, bool scaled, bool last>
-MORVIK_INLINE_CALLS void runPass(const lanes::Workspace& workspace, unsigned d, const std::int16_t* joint, bool first)
+template <template <unsigned> class RuleOf,
+          unsigned count,
+          unsigned vectors,
+          unsigned abreast,
+          Extrinsic extrinsic,
+          Ratios ratios>
+MORVIK_INLINE_CALLS void runPass(const Workspace& workspace, unsigned d, const std::int16_t* joint, bool isFirst)
 {
-    Pass<RuleOf, count, vectors, abreast, scaled>(workspace, d, joint).template run<last>(first);
+    Pass<RuleOf, count, vectors, abreast, extrinsic>(workspace, d, joint).template run<ratios>(isFirst);
 }
 
-}  // namespace MORVIK_LANES
+}  // namespace morvik::lanes::MORVIK_LANES
 
 #endif

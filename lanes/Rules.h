@@ -2,27 +2,27 @@
 #ifndef MORVIK_LANES_RULES_H
 #define MORVIK_LANES_RULES_H
 
-#include "Permute.h"
+#include "Machine.h"
 #include "Words.h"
 #include "rules/Trellis.h"
 #include "rules/TrellisDecision.h"
 
-namespace MORVIK_LANES {
+namespace morvik::lanes::MORVIK_LANES {
 
 template <unsigned count>
-using StepsColumn = std::array<Steps<count>, rules::stateCount>;
+using StateMetrics = std::array<Eighths<count>, rules::stateCount>;
 
 template <unsigned count>
-using StepsBranches = rules::BranchMetrics<Steps<count>>;
+using BranchMetrics = rules::BranchMetrics<Eighths<count>>;
 
 /// The eight metrics of a slot, side by side in memory.
 template <unsigned count>
 struct StoredColumn {
     const std::int16_t* metrics;
 
-    MORVIK_INLINE Steps<count> operator[](unsigned state) const
+    MORVIK_INLINE Eighths<count> operator[](unsigned state) const
     {
-        return Steps<count>::load(metrics + state * count);
+        return Eighths<count>::load(metrics + state * count);
     }
 };
 
@@ -30,7 +30,7 @@ struct StoredColumn {
 template <unsigned countOfLanes>
 struct Greatest {
     static constexpr unsigned count = countOfLanes;
-    using Decision = rules::DecideMax<Steps<count>>;
+    using Decision = rules::DecideMax<Eighths<count>>;
     static constexpr bool fewRegisters = true;
 
     explicit MORVIK_INLINE Greatest(const std::uint8_t*) {}
@@ -43,17 +43,17 @@ struct Greatest {
     /// Takes b a step back and gives the step's ratio. The greatest of all does not depend on the order of
     /// comparison, nor on when the branch metric is added: the candidates of the backward recursion serve
     /// once more, pair by pair.
-    MORVIK_INLINE Steps<count> stepBack(const StoredColumn<count>& a,
-                                        rules::Column<Decision>& b,
-                                        const StepsBranches<count>& g) const
+    MORVIK_INLINE Eighths<count> stepBack(const StoredColumn<count>& a,
+                                          rules::Column<Decision>& b,
+                                          const BranchMetrics<count>& g) const
     {
-        Steps<count> one{};
-        Steps<count> zero{};
+        Eighths<count> one{};
+        Eighths<count> zero{};
         b = rules::backwardStep(decision(), b, g, [&](auto pair, const auto& c) MORVIK_INLINE_LAMBDA {
-            const Steps<count> even = a[2 * pair];
-            const Steps<count> odd = a[2 * pair + 1];
-            const Steps<count> bestOne = max(even + c.one[0], odd + c.one[1]);
-            const Steps<count> bestZero = max(even + c.zero[0], odd + c.zero[1]);
+            const Eighths<count> even = a[2 * pair];
+            const Eighths<count> odd = a[2 * pair + 1];
+            const Eighths<count> bestOne = max(even + c.one[0], odd + c.one[1]);
+            const Eighths<count> bestZero = max(even + c.zero[0], odd + c.zero[1]);
             one = pair == 0 ? bestOne : max(one, bestOne);
             zero = pair == 0 ? bestZero : max(zero, bestZero);
         });
@@ -64,12 +64,12 @@ struct Greatest {
 /// The correction table, called with a decision difference.
 template <unsigned count>
 struct Corrections {
-    Table<count> table;
+    Machine::Table<count> table;
 
-    MORVIK_INLINE Steps<count> operator()(Steps<count> difference) const
+    MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
     {
-        const Steps<count> magnitude = max(difference, Steps<count>::of(-1) - difference);  // -1 reads like 0
-        return table.at(min(magnitude, Steps<count>::of(4 * 15)) >> 2);
+        const Eighths<count> magnitude = max(difference, Eighths<count>::of(-1) - difference);  // -1 reads like 0
+        return table.at(min(magnitude, Eighths<count>::of(4 * 15)) >> 2);
     }
 };
 
@@ -77,23 +77,23 @@ struct Corrections {
 template <unsigned countOfLanes>
 struct Corrected {
     static constexpr unsigned count = countOfLanes;
-    using Decision = rules::DecideMaxHash<Steps<count>, Corrections<count>>;
+    using Decision = rules::DecideMaxHash<Eighths<count>, Corrections<count>>;
     static constexpr bool fewRegisters = false;
     Corrections<count> corrections;
 
-    explicit MORVIK_INLINE Corrected(const std::uint8_t* table) : corrections{Table<count>(table)} {}
+    explicit MORVIK_INLINE Corrected(const std::uint8_t* table) : corrections{Machine::Table<count>(table)} {}
 
     MORVIK_INLINE Decision decision() const
     {
         return Decision(corrections);
     }
 
-    MORVIK_INLINE Steps<count> stepBack(const StoredColumn<count>& a,
-                                        rules::Column<Decision>& b,
-                                        const StepsBranches<count>& g) const
+    MORVIK_INLINE Eighths<count> stepBack(const StoredColumn<count>& a,
+                                          rules::Column<Decision>& b,
+                                          const BranchMetrics<count>& g) const
     {
-        StepsColumn<count> alpha{};
-        StepsColumn<count> beta{};
+        StateMetrics<count> alpha{};
+        StateMetrics<count> beta{};
         rules::forEach<rules::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
             alpha[state] = a[state];
             beta[state] = Decision::stored(b[state]);
@@ -103,6 +103,6 @@ struct Corrected {
     }
 };
 
-}  // namespace MORVIK_LANES
+}  // namespace morvik::lanes::MORVIK_LANES
 
 #endif

@@ -1,16 +1,17 @@
-// Transpose: between the caller's arrays, position by position, and rows, step by step.
+// Transpose: between the caller's arrays, one for each lane, and slices, one for each step.
 #ifndef MORVIK_LANES_TRANSPOSE_H
 #define MORVIK_LANES_TRANSPOSE_H
 
 #include <cstdint>
 #include <cstring>
 
-#include "Words.h"
+#include "Machine.h"
+#include "rules/Formats.h"
 
-namespace MORVIK_LANES {
+namespace morvik::lanes::MORVIK_LANES {
 
 /// Eight by eight words, in each of `halves` halves of eight vectors: vector i holds eight steps of lane i, and of
-/// lane 8 + i, or a step of eight lanes, and of the next eight.
+/// lane 8 + i; transposed, step i of eight lanes, and of the next eight.
 template <unsigned halves>
 class Tile {
 public:
@@ -74,34 +75,18 @@ private:
     Vector itsVectors[size];
 };
 
-/// What the instruction set does best on rows of `lanes` lanes.
-#if defined(__AVX2__)
-template <unsigned lanes>
-using TileOfRows = Tile<(lanes < 16 ? 1 : 2)>;
-#else
-template <unsigned lanes>
-using TileOfRows = Tile<1>;
-#endif
+/// The best one for vectors of `count` lanes.
+template <unsigned count>
+using TileOf = Tile<(count < 16 ? 1 : Machine::tileHalves)>;
 
-/// Eight of the caller's values, at any address. Those beyond 16 bits, of which only the low 24 count (rule 4), come
-/// out as some others that are beyond the input format, too.
+/// Eight of the caller's values, at any address. Only their low 24 bits count (rule 4); what is beyond 16 bits comes
+/// out as another value beyond the input format.
 template <class Input>
 MORVIK_INLINE Raw<8>::Signed inputWords(const Input* values)
 {
     using Words = Raw<8>::Signed;
     if constexpr (sizeof(Input) == 4) {
-#if defined(__SSE2__)
-        const auto* const quads = reinterpret_cast<const __m128i*>(values);
-        return (Words)_mm_packs_epi32(_mm_loadu_si128(quads), _mm_loadu_si128(quads + 1));
-#else
-        std::int32_t copies[8];
-        std::memcpy(copies, values, sizeof copies);
-        Words words;
-        for (unsigned i = 0; i < 8; ++i) {
-            words[i] = static_cast<std::int16_t>(copies[i] < -32768 ? -32768 : copies[i] > 32767 ? 32767 : copies[i]);
-        }
-        return words;
-#endif
+        return Machine::saturated(values);
     } else if constexpr (sizeof(Input) == 2) {
         Words words;
         std::memcpy(&words, values, sizeof words);
@@ -114,12 +99,12 @@ MORVIK_INLINE Raw<8>::Signed inputWords(const Input* values)
     }
 }
 
-/// Eight values for each half of a tile. Any beyond the input format, -128 to 127, leaves bits in `beyond` above
-/// the low eight.
+/// Eight values for each half of a tile. One beyond the input format, -128 to 127, leaves bits in `beyond` above the
+/// low eight.
 template <class AnyTile, class Input>
-MORVIK_INLINE typename AnyTile::Vector inputSteps(const Input* const* arrays,
-                                                  unsigned k,
-                                                  typename AnyTile::Unsigned& beyond)
+MORVIK_INLINE typename AnyTile::Vector inputVector(const Input* const* arrays,
+                                                   unsigned k,
+                                                   typename AnyTile::Unsigned& beyond)
 {
     typename AnyTile::Vector words;
     if constexpr (AnyTile::lanes == 8) {
@@ -132,57 +117,58 @@ MORVIK_INLINE typename AnyTile::Vector inputSteps(const Input* const* arrays,
     return words;
 }
 
-/// Fills rows of `lanes` values, a multiple of eight, from as many arrays of `steps` values each, eight or
-/// more. Returns whether all values were within the input format; else the rows are good for nothing.
-template <unsigned lanes, class Input>
-bool loadRows(const Input* const* arrays, unsigned steps, std::int16_t* rows)
+/// Fills slices of `count` values, a multiple of eight, from as many arrays of `steps` values each, eight or more.
+/// Returns whether all values were within the input format; otherwise the slices are useless.
+template <unsigned count, class Input>
+bool fillSlices(const Input* const* arrays, unsigned steps, std::int16_t* slices)
 {
-    using RowTile = TileOfRows<lanes>;
-    typename RowTile::Unsigned beyond{};
-    for (unsigned lane = 0; lane < lanes; lane += RowTile::lanes) {
-        for (unsigned next = 0; next < steps; next += RowTile::size) {
-            const unsigned k = next + RowTile::size <= steps ? next : steps - RowTile::size;
-            RowTile tile;
-            for (unsigned i = 0; i < RowTile::size; ++i) {
-                tile[i] = inputSteps<RowTile>(arrays + lane + i, k, beyond);
+    using BestTile = TileOf<count>;
+    typename BestTile::Unsigned beyond{};
+    for (unsigned lane = 0; lane < count; lane += BestTile::lanes) {
+        for (unsigned next = 0; next < steps; next += BestTile::size) {
+            const unsigned k = next + BestTile::size <= steps ? next : steps - BestTile::size;
+            BestTile tile;
+            for (unsigned i = 0; i < BestTile::size; ++i) {
+                tile[i] = inputVector<BestTile>(arrays + lane + i, k, beyond);
             }
             tile.transpose();
-            for (unsigned i = 0; i < RowTile::size; ++i) {
-                std::memcpy(rows + (k + i) * lanes + lane, &tile[i], sizeof tile[i]);
+            for (unsigned i = 0; i < BestTile::size; ++i) {
+                std::memcpy(slices + (k + i) * count + lane, &tile[i], sizeof tile[i]);
             }
         }
     }
     unsigned any = 0;
-    for (unsigned i = 0; i < RowTile::lanes; ++i) {
+    for (unsigned i = 0; i < BestTile::lanes; ++i) {
         any |= beyond[i];
     }
     return any < 256;
 }
 
-/// Spreads rows of ratios over arrays, one for each lane: the aligned ratios, or the decisions they make.
-template <unsigned lanes, class Output>
-void storeRows(const std::int16_t* rows, unsigned steps, Output* const* arrays)
+/// Spreads slices of ratios over arrays, one for each lane: as aligned words, or as the decisions they make.
+template <unsigned count, class Output>
+void spreadSlices(const std::int16_t* slices, unsigned steps, Output* const* arrays)
 {
-    using RowTile = TileOfRows<lanes>;
-    typedef Output Outputs __attribute__((vector_size(RowTile::lanes * sizeof(Output))));
-    for (unsigned lane = 0; lane < lanes; lane += RowTile::lanes) {
-        for (unsigned next = 0; next < steps; next += RowTile::size) {
-            const unsigned k = next + RowTile::size <= steps ? next : steps - RowTile::size;
-            RowTile tile;
-            for (unsigned i = 0; i < RowTile::size; ++i) {
-                std::memcpy(&tile[i], rows + (k + i) * lanes + lane, sizeof tile[i]);
+    using BestTile = TileOf<count>;
+    typedef Output Outputs __attribute__((vector_size(BestTile::lanes * sizeof(Output))));
+    for (unsigned lane = 0; lane < count; lane += BestTile::lanes) {
+        for (unsigned next = 0; next < steps; next += BestTile::size) {
+            const unsigned k = next + BestTile::size <= steps ? next : steps - BestTile::size;
+            BestTile tile;
+            for (unsigned i = 0; i < BestTile::size; ++i) {
+                std::memcpy(&tile[i], slices + (k + i) * count + lane, sizeof tile[i]);
             }
             tile.transpose();
-            for (unsigned i = 0; i < RowTile::size; ++i) {
+            for (unsigned i = 0; i < BestTile::size; ++i) {
                 Outputs values;
                 if constexpr (sizeof(Output) == 1) {
                     // A ratio of 0 or more decides for 1 (rule 16): its sign bit is clear.
                     values = __builtin_convertvector((tile[i] >> 15) + 1, Outputs);
                 } else {
-                    // A step is 16 in an aligned word, which wraps.
-                    values = reinterpret_cast<Outputs>(reinterpret_cast<typename RowTile::Unsigned>(tile[i]) << 4);
+                    // Aligned words wrap (rule 8).
+                    values = reinterpret_cast<Outputs>(reinterpret_cast<typename BestTile::Unsigned>(tile[i])
+                                                       << static_cast<int>(rules::stateAlignment));
                 }
-                for (unsigned half = 0; half < RowTile::lanes / 8; ++half) {
+                for (unsigned half = 0; half < BestTile::lanes / 8; ++half) {
                     std::memcpy(arrays[lane + 8 * half + i] + k,
                                 reinterpret_cast<const Output*>(&values) + 8 * half,
                                 8 * sizeof(Output));
@@ -192,6 +178,6 @@ void storeRows(const std::int16_t* rows, unsigned steps, Output* const* arrays)
     }
 }
 
-}  // namespace MORVIK_LANES
+}  // namespace morvik::lanes::MORVIK_LANES
 
 #endif

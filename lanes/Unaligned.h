@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <cstring>
 
-namespace lanes {
+namespace morvik::lanes {
 
 template <class Value>
 Value valueAt(const Value* array, std::size_t i)
@@ -21,6 +21,6 @@ void setValueAt(Value* array, std::size_t i, Value value)
     std::memcpy(array + i, &value, sizeof value);
 }
 
-}  // namespace lanes
+}  // namespace morvik::lanes
 
 #endif

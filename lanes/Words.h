@@ -1,10 +1,10 @@
 // Words: vectors of 16-bit words, the value type over which the lanes run the trellis.
 //
-// `Steps` holds whole steps of the formats, which is an aligned word divided by 16, and is never wrapped: four
-// spare bits let a plain maximum decide (Bounds.h proves it).
+// `Eighths` counts eighths, the unit of soft values and metrics. An aligned word has four bits below it, always 0;
+// without them, four bits are to spare, no metric wraps, and a plain maximum decides (Bounds.h proves it).
 //
-// This text is compiled once for each instruction set, in a namespace of its own, MORVIK_LANES, so that
-// nothing that is compiled for one can serve another.
+// Each instruction set compiles this text in a namespace of its own, MORVIK_LANES, so that nothing compiled for one
+// serves another.
 #ifndef MORVIK_LANES_WORDS_H
 #define MORVIK_LANES_WORDS_H
 
@@ -13,13 +13,7 @@
 
 #include "rules/Arithmetic.h"
 
-#if defined(__SSE2__)
-#include <immintrin.h>
-#endif
-
-namespace MORVIK_LANES {
-
-namespace rules = morvik::rules;
+namespace morvik::lanes::MORVIK_LANES {
 
 template <unsigned count>
 struct Raw {
@@ -27,20 +21,20 @@ struct Raw {
     typedef std::uint16_t Unsigned __attribute__((vector_size(2 * count)));
 };
 
-/// Whole steps, in each of `count` lanes. No operation leaves 16 bits.
+/// Eighths, in each of `count` lanes. No operation leaves 16 bits.
 template <unsigned count>
-struct Steps {
+struct Eighths {
     using Vector = typename Raw<count>::Signed;
 
     Vector v;
 
-    static MORVIK_INLINE Steps of(int value)
+    static MORVIK_INLINE Eighths of(int value)
     {
         return {Vector{} + static_cast<std::int16_t>(value)};
     }
 
     /// From an address that is a multiple of the vector's size.
-    static MORVIK_INLINE Steps load(const std::int16_t* from)
+    static MORVIK_INLINE Eighths load(const std::int16_t* from)
     {
         Vector v;
         std::memcpy(&v, __builtin_assume_aligned(from, sizeof v), sizeof v);
@@ -52,69 +46,69 @@ struct Steps {
         std::memcpy(__builtin_assume_aligned(to, sizeof v), &v, sizeof v);
     }
 
-    friend MORVIK_INLINE Steps operator+(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths operator+(Eighths a, Eighths b)
     {
         return {a.v + b.v};
     }
 
-    friend MORVIK_INLINE Steps operator-(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths operator-(Eighths a, Eighths b)
     {
         return {a.v - b.v};
     }
 
-    friend MORVIK_INLINE Steps operator&(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths operator&(Eighths a, Eighths b)
     {
         return {a.v & b.v};
     }
 
-    friend MORVIK_INLINE Steps operator|(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths operator|(Eighths a, Eighths b)
     {
         return {a.v | b.v};
     }
 
     /// Divided by 2^bits, rounded down.
-    friend MORVIK_INLINE Steps operator>>(Steps a, int bits)
+    friend MORVIK_INLINE Eighths operator>>(Eighths a, int bits)
     {
         return {a.v >> bits};
     }
 
-    friend MORVIK_INLINE Steps max(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths max(Eighths a, Eighths b)
     {
         return {a.v > b.v ? a.v : b.v};
     }
 
-    friend MORVIK_INLINE Steps min(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths min(Eighths a, Eighths b)
     {
         return {a.v < b.v ? a.v : b.v};
     }
 
-    friend MORVIK_INLINE Steps clip(Steps a, int lo, int hi)
+    friend MORVIK_INLINE Eighths clip(Eighths a, int lo, int hi)
     {
         return max(min(a, of(hi)), of(lo));
     }
 
     /// b where mask is all ones, a where it is 0.
-    friend MORVIK_INLINE Steps blend(Steps mask, Steps a, Steps b)
+    friend MORVIK_INLINE Eighths blend(Eighths mask, Eighths a, Eighths b)
     {
         return {(a.v & ~mask.v) | (b.v & mask.v)};
     }
 
-    friend MORVIK_INLINE Steps addWrap(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths addWrap(Eighths a, Eighths b)
     {
         return a + b;
     }
 
-    friend MORVIK_INLINE Steps subWrap(Steps a, Steps b)
+    friend MORVIK_INLINE Eighths subWrap(Eighths a, Eighths b)
     {
         return a - b;
     }
 
-    friend MORVIK_INLINE Steps select(Steps difference, Steps c1, Steps c2)
+    friend MORVIK_INLINE Eighths select(Eighths difference, Eighths c1, Eighths c2)
     {
         return {difference.v < 0 ? c2.v : c1.v};
     }
 
-    friend MORVIK_INLINE Steps maxWrap(Steps c1, Steps c2)
+    friend MORVIK_INLINE Eighths maxWrap(Eighths c1, Eighths c2)
     {
         return max(c1, c2);
     }
@@ -122,7 +116,7 @@ struct Steps {
 
 /// The lanes of two vectors, side by side in one.
 template <unsigned count>
-MORVIK_INLINE Steps<2 * count> join(Steps<count> a, Steps<count> b)
+MORVIK_INLINE Eighths<2 * count> join(Eighths<count> a, Eighths<count> b)
 {
     static_assert(count == 8);
     return {__builtin_shufflevector(a.v, b.v, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15)};
@@ -130,7 +124,7 @@ MORVIK_INLINE Steps<2 * count> join(Steps<count> a, Steps<count> b)
 
 /// Part `index` of a vector of which each has `count` lanes.
 template <unsigned count, unsigned index, unsigned wide>
-MORVIK_INLINE Steps<count> part(Steps<wide> a)
+MORVIK_INLINE Eighths<count> part(Eighths<wide> a)
 {
     if constexpr (count == wide) {
         return a;
@@ -141,28 +135,6 @@ MORVIK_INLINE Steps<count> part(Steps<wide> a)
     }
 }
 
-/// floor(3 a / 8), for any a whose threefold fits 16 bits.
-template <unsigned count>
-MORVIK_INLINE Steps<count> threeEighths(Steps<count> a)
-{
-#if defined(__AVX512BW__)
-    if constexpr (count == 32) {
-        return {(typename Steps<count>::Vector)_mm512_mulhi_epi16((__m512i)a.v, _mm512_set1_epi16(3 << 13))};
-    }
-#endif
-#if defined(__AVX2__)
-    if constexpr (count == 16) {
-        return {(typename Steps<count>::Vector)_mm256_mulhi_epi16((__m256i)a.v, _mm256_set1_epi16(3 << 13))};
-    }
-#endif
-#if defined(__SSE2__)
-    if constexpr (count == 8) {
-        return {(typename Steps<count>::Vector)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(3 << 13))};
-    }
-#endif
-    return (a + a + a) >> 3;
-}
-
-}  // namespace MORVIK_LANES
+}  // namespace morvik::lanes::MORVIK_LANES
 
 #endif

@@ -14,8 +14,9 @@ namespace simulation_call {
 
 /// A single call hands over a batch of one.
 struct Batch {
-    using Streams =
-        std::variant<lanes::Streams<std::int32_t>, lanes::Streams<std::int16_t>, lanes::Streams<std::int8_t>>;
+    using Streams = std::variant<morvik::lanes::Streams<std::int32_t>,
+                                 morvik::lanes::Streams<std::int16_t>,
+                                 morvik::lanes::Streams<std::int8_t>>;
 
     Streams streams;  ///< of all blocks, one block after the other
     std::int32_t dinSize;
@@ -33,12 +34,12 @@ struct Batch {
 
     std::uint32_t tag(std::size_t block) const
     {
-        return tags == nullptr ? 0 : lanes::valueAt(tags, block);
+        return tags == nullptr ? 0 : morvik::lanes::valueAt(tags, block);
     }
 
     /// Of all blocks' streams those of one block.
     template <class Input>
-    lanes::Streams<Input> streamsOf(const lanes::Streams<Input>& all, std::size_t block) const
+    morvik::lanes::Streams<Input> streamsOf(const morvik::lanes::Streams<Input>& all, std::size_t block) const
     {
         const std::size_t first = block * static_cast<std::size_t>(dinSize);
         return {all.systematic + first, all.parity1 + first, all.parity2 + first};

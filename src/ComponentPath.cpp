@@ -50,7 +50,7 @@ Status ComponentPath::countErrors(unsigned iterations, const std::uint8_t* sent,
     const Status status = decodeWith(
         itsState, [&](TDecoder& decoder) { return decoder.decode(itsSoft, reference, bitErrors, blockErrors); });
     for (std::size_t t = 0; status == simulation_call::success && t < iterations; ++t) {
-        lanes::setValueAt(errors, t, static_cast<std::uint32_t>(bitErrors[t]));
+        morvik::lanes::setValueAt(errors, t, static_cast<std::uint32_t>(bitErrors[t]));
     }
     return status;
 }

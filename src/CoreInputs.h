@@ -32,7 +32,7 @@ void forEachSoftValue(State& state, const simulation_call::Batch& batch, std::si
         const decltype(of.systematic) streams[] = {of.systematic, of.parity1, of.parity2};
         for (std::int32_t i = 0; i < batch.dinSize; ++i) {
             for (unsigned s = 0; s < 3; ++s) {
-                const auto value = std::int32_t{lanes::valueAt(streams[s], static_cast<std::size_t>(i))};
+                const auto value = std::int32_t{morvik::lanes::valueAt(streams[s], static_cast<std::size_t>(i))};
                 const auto [kept, excess] =
                     morvik::rules::inputInteger(value, input.itsShift, input.itsMinQ, input.itsMaxQ);
                 if (!state.saturation_reported && excess != 0) {

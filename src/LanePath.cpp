@@ -11,9 +11,9 @@ using simulation_call::Status;
 namespace {
 
 /// The engine's table, by quarters of a difference's magnitude in steps: its finest resolution (rule 9).
-lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
+morvik::lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
 {
-    lanes::CorrectionTable table = {};
+    morvik::lanes::CorrectionTable table = {};
     const auto* base = dynamic_cast<const TCalculationEngineModBase*>(&engine);
     if (base == nullptr || base->itsAlphaLUT == nullptr) {
         return table;
@@ -48,7 +48,7 @@ void setPlaces(std::vector<Value*>& blocks, Value* first, std::size_t K)
 LanePath::LanePath(veltra_ip_morvik_v1_0_state& state,
                    OriginalComponents& originals,
                    MissedBlocks& missedBlocks,
-                   const lanes::InstructionSet& instructionSet)
+                   const morvik::lanes::InstructionSet& instructionSet)
     : itsState(state),
       itsOriginals(originals),
       itsMissedBlocks(missedBlocks),
@@ -57,16 +57,18 @@ LanePath::LanePath(veltra_ip_morvik_v1_0_state& state,
     setInstructionSet(instructionSet);
 }
 
-const lanes::InstructionSet& LanePath::instructionSet() const
+const morvik::lanes::InstructionSet& LanePath::instructionSet() const
 {
     return itsLanes->instructionSet();
 }
 
-void LanePath::setInstructionSet(const lanes::InstructionSet& instructionSet)
+void LanePath::setInstructionSet(const morvik::lanes::InstructionSet& instructionSet)
 {
     handOverLastBlock();
-    itsLanes = std::make_unique<lanes::LaneDecoder>(
-        instructionSet, static_cast<lanes::Algorithm>(itsOriginals.generics().C_ALGORITHM_TYPE), itsCorrections);
+    itsLanes = std::make_unique<morvik::lanes::LaneDecoder>(
+        instructionSet,
+        static_cast<morvik::lanes::Algorithm>(itsOriginals.generics().C_ALGORITHM_TYPE),
+        itsCorrections);
 }
 
 unsigned LanePath::take(const Batch& batch, std::size_t first, unsigned most)
@@ -101,7 +103,7 @@ void LanePath::prepare(unsigned K)
 
 /// False when a value is beyond the input format: the blocks have to be loaded again, clipped.
 template <class Input>
-bool LanePath::load(const Batch& batch, const lanes::Streams<Input>& all, std::size_t first, unsigned most)
+bool LanePath::load(const Batch& batch, const morvik::lanes::Streams<Input>& all, std::size_t first, unsigned most)
 {
     const unsigned taken = itsLanes->blocksTaken(most);
     auto& blocks = std::get<Blocks<Input>>(itsBlocks);
@@ -150,7 +152,7 @@ Status LanePath::countErrors(unsigned iterations, const std::uint8_t* sent, std:
         itsLanes->decode(2 * t, 2 * t + 2);
         decisions(bits.data());
         for (std::size_t b = 0; b < itsTaken; ++b) {
-            lanes::setValueAt(errors, b * iterations + t, differences(&bits[b * K], sent + b * K, K));
+            morvik::lanes::setValueAt(errors, b * iterations + t, differences(&bits[b * K], sent + b * K, K));
         }
     }
     count(iterations);

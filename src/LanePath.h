@@ -21,10 +21,10 @@ public:
     LanePath(veltra_ip_morvik_v1_0_state& state,
              OriginalComponents& originals,
              MissedBlocks& missedBlocks,
-             const lanes::InstructionSet& instructionSet);
+             const morvik::lanes::InstructionSet& instructionSet);
 
-    const lanes::InstructionSet& instructionSet() const;
-    void setInstructionSet(const lanes::InstructionSet& instructionSet);
+    const morvik::lanes::InstructionSet& instructionSet() const;
+    void setInstructionSet(const morvik::lanes::InstructionSet& instructionSet);
 
     unsigned take(const simulation_call::Batch& batch, std::size_t first, unsigned most) override;
     simulation_call::Status decode(unsigned iterations) override;
@@ -41,19 +41,22 @@ public:
 
 private:
     template <class Input>
-    using Blocks = std::vector<lanes::Streams<Input>>;
+    using Blocks = std::vector<morvik::lanes::Streams<Input>>;
 
     void prepare(unsigned K);
     template <class Input>
-    bool load(const simulation_call::Batch& batch, const lanes::Streams<Input>& all, std::size_t first, unsigned most);
+    bool load(const simulation_call::Batch& batch,
+              const morvik::lanes::Streams<Input>& all,
+              std::size_t first,
+              unsigned most);
     void loadClipped(const simulation_call::Batch& batch, std::size_t first);
     void count(unsigned iterations);
 
     veltra_ip_morvik_v1_0_state& itsState;
     OriginalComponents& itsOriginals;
     MissedBlocks& itsMissedBlocks;
-    const lanes::CorrectionTable itsCorrections;
-    std::unique_ptr<lanes::LaneDecoder> itsLanes;
+    const morvik::lanes::CorrectionTable itsCorrections;
+    std::unique_ptr<morvik::lanes::LaneDecoder> itsLanes;
     unsigned itsTaken = 0;       ///< blocks
     unsigned itsIterations = 0;  ///< that these were decoded with; 0: not yet
 

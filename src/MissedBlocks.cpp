@@ -38,7 +38,7 @@ private:
 
 }  // namespace
 
-void MissedBlocks::add(lanes::LoadedBlock input, unsigned K, unsigned iterations)
+void MissedBlocks::add(morvik::lanes::LoadedBlock input, unsigned K, unsigned iterations)
 {
     itsBlocks.push_back({std::move(input), K, iterations});
 }

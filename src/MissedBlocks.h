@@ -15,7 +15,7 @@ public:
     explicit MissedBlocks(OriginalComponents& originals) : itsOriginals(originals) {}
 
     /// Adds a block that the lanes have decoded.
-    void add(lanes::LoadedBlock input, unsigned K, unsigned iterations);
+    void add(morvik::lanes::LoadedBlock input, unsigned K, unsigned iterations);
 
     /// Drops the blocks that a decode of K bits overwrites.
     void overwrite(unsigned K);
@@ -28,7 +28,7 @@ public:
 
 private:
     struct Block {
-        lanes::LoadedBlock input;
+        morvik::lanes::LoadedBlock input;
         unsigned K;
         unsigned iterations;
     };

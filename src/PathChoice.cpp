@@ -13,7 +13,7 @@ bool isWatched(const TDecoder& decoder)
 
 }  // namespace
 
-PathChoice::PathChoice(State& state, const lanes::InstructionSet& instructionSet)
+PathChoice::PathChoice(State& state, const morvik::lanes::InstructionSet& instructionSet)
     : itsState(state),
       itsOriginals(state),
       itsMissedBlocks(itsOriginals),
@@ -52,12 +52,12 @@ void PathChoice::forgetBlocksOfOthers()
     }
 }
 
-const lanes::InstructionSet* PathChoice::instructionSet() const
+const morvik::lanes::InstructionSet* PathChoice::instructionSet() const
 {
     return !itsComponentsAreWanted && itsOriginals.areIn(itsState) ? &itsLanes.instructionSet() : nullptr;
 }
 
-void PathChoice::useLanes(const lanes::InstructionSet& instructionSet)
+void PathChoice::useLanes(const morvik::lanes::InstructionSet& instructionSet)
 {
     itsLanes.setInstructionSet(instructionSet);
     itsComponentsAreWanted = false;

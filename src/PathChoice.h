@@ -11,7 +11,7 @@ public:
     using State = veltra_ip_morvik_v1_0_state;
 
     /// For a state whose components have just been made; it must outlive this.
-    PathChoice(State& state, const lanes::InstructionSet& instructionSet);
+    PathChoice(State& state, const morvik::lanes::InstructionSet& instructionSet);
 
     /// The lanes, ready for blocks of K bits; null where the components have to decode: somebody watches them, has
     /// changed them or asks for them, or K is no block size. Exhausted memory throws std::bad_alloc.
@@ -21,8 +21,8 @@ public:
     void catchUp();
 
     /// What the lanes run on; null while the components are asked for or changed.
-    const lanes::InstructionSet* instructionSet() const;
-    void useLanes(const lanes::InstructionSet& instructionSet);
+    const morvik::lanes::InstructionSet* instructionSet() const;
+    void useLanes(const morvik::lanes::InstructionSet& instructionSet);
     void useComponents();
 
 private:

@@ -133,7 +133,7 @@ void deliver(State& state, const Batch& batch, BlockPath& path, std::size_t firs
     for (std::size_t b = first; b < first + taken; ++b) {
         const std::uint32_t kept = core_inputs::truncateTag(state, batch.tag(b));
         if (outputs.tags != nullptr) {
-            lanes::setValueAt(outputs.tags, b, kept);
+            morvik::lanes::setValueAt(outputs.tags, b, kept);
         }
     }
     if (first + taken == batch.blocks) {

@@ -17,7 +17,7 @@ using Outputs = veltra_ip_morvik_v1_0_batch_outputs;
 using State = veltra_ip_morvik_v1_0_state;
 
 template <class Input>
-using Streams = lanes::Streams<Input>;
+using Streams = morvik::lanes::Streams<Input>;
 
 std::int32_t simulateGuarded(State* state, const Batch& batch, Outputs* outputs)
 {
@@ -32,7 +32,7 @@ std::int32_t countErrorsGuarded(State* state, const Batch& batch, const ErrorCou
 Status setInstructionSet(State& state, std::string_view wanted)
 {
     std::string known;
-    for (const lanes::InstructionSet* set : lanes::availableInstructionSets()) {
+    for (const morvik::lanes::InstructionSet* set : morvik::lanes::availableInstructionSets()) {
         if (state.path_choice == nullptr) {
             break;
         }
@@ -155,6 +155,7 @@ const char* veltra_ip_morvik_v1_0_get_instruction_set(const veltra_ip_morvik_v1_
         refuse("get_instruction_set called with null state structure");
         return nullptr;
     }
-    const lanes::InstructionSet* set = state->path_choice == nullptr ? nullptr : state->path_choice->instructionSet();
+    const morvik::lanes::InstructionSet* set =
+        state->path_choice == nullptr ? nullptr : state->path_choice->instructionSet();
     return set == nullptr ? byComponents : set->name;
 }

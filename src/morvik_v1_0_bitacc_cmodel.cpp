@@ -49,7 +49,7 @@ const char* build(State& state)
     if (const char* reason = components::create(state)) {
         return reason;
     }
-    state.path_choice = new PathChoice(state, lanes::bestInstructionSet());
+    state.path_choice = new PathChoice(state, morvik::lanes::bestInstructionSet());
     return nullptr;
 }
 
@@ -135,7 +135,7 @@ int32_t veltra_ip_morvik_v1_0_bitacc_simulate(veltra_ip_morvik_v1_0_state* state
                                               uint32_t tag,
                                               veltra_ip_morvik_v1_0_outputs* outputs)
 {
-    const lanes::Streams<std::int32_t> streams = {rsc1_sys, rsc1_par, rsc2_par};
+    const morvik::lanes::Streams<std::int32_t> streams = {rsc1_sys, rsc1_par, rsc2_par};
     const Batch block = {streams, din_size, 1, iterations, &tag};
     if (outputs == nullptr) {
         return simulate(state, block, nullptr);

@@ -9,7 +9,7 @@ compile=("$1" -std=c++17 "$2" -msse2 -mfpmath=sse "$3" -I"$root" -I"$root/includ
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-"${compile[@]}" -DMORVIK_LANES=lanes_generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
+"${compile[@]}" -DMORVIK_LANES=generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
 "${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -DMORVIK_VERSION='""' "$root"/src/*.cpp \
     "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/builds/digest.cpp" \
     "$work/kernels.o" -o "$program"

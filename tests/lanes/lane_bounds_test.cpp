@@ -63,7 +63,7 @@ Leads kept(Leads leads)
 {
     for (unsigned s = 0; s < stateCount; ++s) {
         for (unsigned t = 0; t < stateCount; ++t) {
-            leads[s][t] += s == t ? 0 : ~lanes::borderMask;
+            leads[s][t] += s == t ? 0 : ~morvik::lanes::borderMask;
         }
     }
     return leads;
@@ -91,7 +91,7 @@ bool shareBranch(unsigned pair, unsigned other)
 /// The greatest value of sign * g.
 int greatestBranch(int sign)
 {
-    return sign > 0 ? lanes::branchMax : -lanes::branchMin;
+    return sign > 0 ? morvik::lanes::branchMax : -morvik::lanes::branchMin;
 }
 
 int signOf(unsigned bit)
@@ -105,7 +105,7 @@ int leadOverBetter(unsigned pair, int sign, unsigned other, const std::array<int
 {
     const bool shared = shareBranch(pair, other);
     int most = -wrapsFrom * wrapsFrom;
-    for (int g = lanes::branchMin; g <= lanes::branchMax; ++g) {
+    for (int g = morvik::lanes::branchMin; g <= morvik::lanes::branchMax; ++g) {
         const int own = shared ? sign * g : greatestBranch(sign);
         most = std::max(most, own + std::min(over[1] - g, over[0] + g));
     }
@@ -154,7 +154,8 @@ int greatestDecision(Direction direction, const Leads& before)
     for (unsigned s = 0; s < stateCount; ++s) {
         const unsigned one = origin(direction, s, 1);
         const unsigned zero = origin(direction, s, 0);
-        most = std::max({most, before[one][zero] + 2 * lanes::branchMax, before[zero][one] - 2 * lanes::branchMin});
+        most = std::max(
+            {most, before[one][zero] + 2 * morvik::lanes::branchMax, before[zero][one] - 2 * morvik::lanes::branchMin});
     }
     return most;
 }
@@ -163,7 +164,7 @@ int greatestDecision(Direction direction, const Leads& before)
 std::vector<Leads> columnsFrom(Direction direction, const Leads& start)
 {
     std::vector<Leads> columns = {start};
-    while (columns.size() <= lanes::longestWindow) {
+    while (columns.size() <= morvik::lanes::longestWindow) {
         columns.push_back(step(direction, columns.back()));
     }
     return columns;
@@ -177,7 +178,7 @@ Leads anyOf(const std::vector<Leads>& columns, unsigned first)
 Leads knownColumn()
 {
     std::array<int, stateCount> metrics{};
-    metrics.fill(lanes::unlikely);
+    metrics.fill(morvik::lanes::unlikely);
     metrics[0] = 0;
     return leadsOf(metrics);
 }
@@ -189,7 +190,7 @@ Leads tailColumn()
     Leads leads = leadsOf({});
     for (unsigned signs = 0; signs < 64; ++signs) {
         const auto value = [signs](unsigned i) {
-            return (signs >> i & 1U) != 0 ? lanes::branchMax : lanes::branchMin;
+            return (signs >> i & 1U) != 0 ? morvik::lanes::branchMax : morvik::lanes::branchMin;
         };
         leads = either(leads,
                        leadsOf(rules::tailColumn<int>(
@@ -296,12 +297,13 @@ int overAllSteps(const std::function<int(const Leads&, const Leads&)>& figure)
 
 TEST(LaneBounds, OfAColumn)
 {
-    EXPECT_EQ(greatest(forward().fromEnd[0]), -lanes::unlikely);
+    EXPECT_EQ(greatest(forward().fromEnd[0]), -morvik::lanes::unlikely);
     EXPECT_EQ(greatest(anyOf(forward().fromEnd, 0)), 1228);
     EXPECT_EQ(greatest(backward().fromEnd[0]), 1287);
     EXPECT_EQ(greatest(anyOf(backward().fromEnd, 0)), 1287);
     for (const Recursion* recursion : {&forward(), &backward()}) {
-        EXPECT_EQ(recursion->fromEnd[lanes::longestWindow], recursion->fromEnd[lanes::longestWindow - 1])
+        EXPECT_EQ(recursion->fromEnd[morvik::lanes::longestWindow],
+                  recursion->fromEnd[morvik::lanes::longestWindow - 1])
             << "longer recursions have to be looked at";
         EXPECT_EQ(greatest(anyOf(recursion->fromEnd, 3)), 786);
         EXPECT_EQ(greatest(recursion->border), 670);
@@ -341,14 +343,15 @@ TEST(LaneBounds, OfARatio)
 /// to 0 by state 0, up to a kept column's low bits.
 TEST(LaneBounds, OfSixteenBits)
 {
-    const int tail = 6 * -lanes::branchMin + ~lanes::borderMask;
-    const int broughtBack =
-        std::max(greatest(anyOf(forward().fromEnd, fewestSteps)), greatest(forward().inside)) + ~lanes::borderMask;
-    const int start = std::max({-lanes::unlikely, tail, broughtBack, greatest(backward().border)});
+    const int tail = 6 * -morvik::lanes::branchMin + ~morvik::lanes::borderMask;
+    const int broughtBack = std::max(greatest(anyOf(forward().fromEnd, fewestSteps)), greatest(forward().inside)) +
+                            ~morvik::lanes::borderMask;
+    const int start = std::max({-morvik::lanes::unlikely, tail, broughtBack, greatest(backward().border)});
     EXPECT_LE(start, 1300);
-    const int reached = start + static_cast<int>(lanes::longestWindow) * (-lanes::branchMin + mostCorrection);
+    const int reached =
+        start + static_cast<int>(morvik::lanes::longestWindow) * (-morvik::lanes::branchMin + mostCorrection);
     EXPECT_LE(reached, 9900);
-    const int sum = 2 * reached - lanes::branchMin + 3 * mostCorrection;
+    const int sum = 2 * reached - morvik::lanes::branchMin + 3 * mostCorrection;
     EXPECT_LE(sum, 20000);
     EXPECT_LE(sum, std::numeric_limits<std::int16_t>::max());
 }

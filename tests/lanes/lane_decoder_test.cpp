@@ -21,12 +21,12 @@
 
 namespace {
 
-using lanes::Algorithm;
-using lanes::LaneDecoder;
+using morvik::lanes::Algorithm;
+using morvik::lanes::LaneDecoder;
 using morvik::rules::Cut;
 
 /// 6 steps up to a magnitude of 63, 4 up to 127, and so on (rule 9), by quarters of a magnitude in steps.
-constexpr lanes::CorrectionTable corrections = {6, 4, 3, 2, 1, 1};
+constexpr morvik::lanes::CorrectionTable corrections = {6, 4, 3, 2, 1, 1};
 
 /// The component path: one decoder with its formats, interleaver and engine.
 struct Components {
@@ -95,7 +95,7 @@ std::vector<Results> laneResults(LaneDecoder& decoder,
                                  const std::vector<morvik::blocks::Block>& blocks,
                                  unsigned passes)
 {
-    std::vector<lanes::Streams<std::int32_t>> streams;
+    std::vector<morvik::lanes::Streams<std::int32_t>> streams;
     streams.reserve(blocks.size());
     std::vector<Results> all(blocks.size(), Results(decoder.cut().K()));
     for (const morvik::blocks::Block& block : blocks) {
@@ -127,7 +127,7 @@ std::string nameOf(Algorithm algorithm)
     return "type " + std::to_string(static_cast<int>(algorithm));
 }
 
-class LaneDecoderTest : public testing::TestWithParam<const lanes::InstructionSet*> {
+class LaneDecoderTest : public testing::TestWithParam<const morvik::lanes::InstructionSet*> {
 protected:
     /// The lanes of the widest row.
     static unsigned lanesOfRow()
@@ -353,14 +353,14 @@ TEST_P(LaneDecoderTest, TiesAreDecodedAlike)
 
 /// Beside 127 and -128 alone, which leave no bit that could hide it.
 template <class Input>
-void expectEachNoticed(const lanes::InstructionSet& instructionSet, Input beyond)
+void expectEachNoticed(const morvik::lanes::InstructionSet& instructionSet, Input beyond)
 {
     constexpr unsigned K = 40;
     LaneDecoder decoder(instructionSet, Algorithm::greatest, corrections);
     decoder.setCut(Cut(K, 2));
     for (const Input within : {Input{-128}, Input{127}}) {
         std::vector<Input> values(3 * (K + 4), within);
-        const lanes::Streams<Input> streams = {&values[0], &values[K + 4], &values[2 * (K + 4)]};
+        const morvik::lanes::Streams<Input> streams = {&values[0], &values[K + 4], &values[2 * (K + 4)]};
         EXPECT_TRUE(decoder.load(&streams, 1));
         for (Input& value : values) {
             value = beyond;
@@ -422,7 +422,7 @@ TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
 
 INSTANTIATE_TEST_SUITE_P(InstructionSets,
                          LaneDecoderTest,
-                         testing::ValuesIn(lanes::availableInstructionSets()),
+                         testing::ValuesIn(morvik::lanes::availableInstructionSets()),
                          [](const auto& set) { return std::string(set.param->name); });
 
 }  // namespace

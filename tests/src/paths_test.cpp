@@ -41,7 +41,7 @@ public:
 
     Batch batch(unsigned iterations) const
     {
-        const lanes::Streams<std::int32_t> streams = {itsSys.data(), itsPar1.data(), itsPar2.data()};
+        const morvik::lanes::Streams<std::int32_t> streams = {itsSys.data(), itsPar1.data(), itsPar2.data()};
         return {streams, itsSize, itsCount, iterations, nullptr};
     }
 

@@ -1,0 +1,316 @@
+// Machine: everything that differs between instruction sets, a section for each that has forms of its own.
+//
+// A section keeps what the one before it does as well. It offers:
+//
+//   VectorLanes             the widths of its vectors
+//   Kernels                 the shapes of its kernels, ascending in lanes
+//   holdsTwoRecursions      whether its registers hold two recursions at a time
+//   tileHalves              halves of the widest tile that it transposes well (Transpose.h)
+//   Permutation<count>      gathers a vector, its lanes permuted
+//   Table<count>            looks up a table of sixteen values in each lane
+//   scaledHalf(a)           floor(3 a / 8), for any a whose threefold fits 16 bits
+//   saturated(values)       eight 32-bit values, limited to 16 bits
+//
+// A permutation takes vectors from slices. Their lanes form groups of `group`, each of which takes all of its values
+// from one group of the source slice: LaneOrder.h orders segments so that the interleaver does. A vector's permutation
+// is prepared as the addresses of `sources` such groups, counted in words, and a control of `bytes` bytes, which says
+// from which lane of its group each lane comes.
+#ifndef MORVIK_LANES_MACHINE_H
+#define MORVIK_LANES_MACHINE_H
+
+#include <utility>
+
+#include "Words.h"
+
+#if defined(__SSE2__)
+#include <immintrin.h>
+#endif
+
+namespace morvik::lanes::MORVIK_LANES {
+
+/// Slices of `vectors` vectors of `count` lanes; up to `abreast` windows of one vector go abreast.
+template <unsigned count, unsigned vectors, unsigned abreast = 1>
+struct Shape {
+};
+
+template <class... ofKernels>
+struct Shapes {
+};
+
+// ---- Any machine
+
+struct Portable {
+    using VectorLanes = std::integer_sequence<unsigned, 8>;
+    using Kernels = Shapes<Shape<8, 1>, Shape<8, 2>, Shape<8, 4>>;
+    static constexpr bool holdsTwoRecursions = false;
+    static constexpr unsigned tileHalves = 1;
+
+    /// The control is the source lanes themselves.
+    template <unsigned count>
+    struct Permutation {
+        static constexpr unsigned group = 8;
+        static constexpr unsigned sources = count / group;
+        static constexpr unsigned bytes = count;
+
+        static void prepare(const std::uint8_t* source, std::uint8_t* control)
+        {
+            std::memcpy(control, source, count);
+        }
+
+        static MORVIK_INLINE Eighths<count> gather(const std::int16_t* slices,
+                                                   const std::uint32_t* from,
+                                                   const std::uint8_t* control)
+        {
+            Eighths<count> result{};
+            for (unsigned lane = 0; lane < count; ++lane) {
+                result.v[lane] = slices[from[lane / group] + control[lane]];
+            }
+            return result;
+        }
+    };
+
+    template <unsigned count>
+    class Table {
+    public:
+        explicit MORVIK_INLINE Table(const std::uint8_t* entries) : itsEntries(entries) {}
+
+        /// The entries at `index`, 0 to 15.
+        MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
+        {
+            Eighths<count> result{};
+            for (unsigned lane = 0; lane < count; ++lane) {
+                result.v[lane] = itsEntries[index.v[lane]];
+            }
+            return result;
+        }
+
+    private:
+        const std::uint8_t* itsEntries;
+    };
+
+    template <unsigned count>
+    static MORVIK_INLINE Eighths<count> scaledHalf(Eighths<count> a)
+    {
+        return (a + a + a) >> 3;
+    }
+
+    /// At any address.
+    static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
+    {
+        std::int32_t copies[8];
+        std::memcpy(copies, values, sizeof copies);
+        Raw<8>::Signed words;
+        for (unsigned i = 0; i < 8; ++i) {
+            words[i] = static_cast<std::int16_t>(copies[i] < -32768 ? -32768 : copies[i] > 32767 ? 32767 : copies[i]);
+        }
+        return words;
+    }
+};
+
+// ---- SSE2, which `generic` has on x86-64
+
+#if defined(__SSE2__)
+struct Sse2 : Portable {
+    static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)
+    {
+        return {(Raw<8>::Signed)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(3 << 13))};
+    }
+
+    static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
+    {
+        const auto* const quads = reinterpret_cast<const __m128i*>(values);
+        return (Raw<8>::Signed)_mm_packs_epi32(_mm_loadu_si128(quads), _mm_loadu_si128(quads + 1));
+    }
+};
+#endif
+
+// ---- SSSE3: byte shuffles
+
+#if defined(__SSSE3__)
+MORVIK_INLINE Eighths<8> shuffleBytes(Eighths<8> a, Eighths<8> control)
+{
+    return {(Raw<8>::Signed)_mm_shuffle_epi8((__m128i)a.v, (__m128i)control.v)};
+}
+
+struct Ssse3 : Sse2 {
+    /// A byte shuffle within each sixteen bytes.
+    template <unsigned count>
+    struct Permutation {
+        static constexpr unsigned group = 8;
+        static constexpr unsigned sources = count / group;
+        static constexpr unsigned bytes = 2 * count;
+
+        static void prepare(const std::uint8_t* source, std::uint8_t* control)
+        {
+            for (unsigned lane = 0; lane < count; ++lane) {
+                control[2 * lane] = static_cast<std::uint8_t>(2 * source[lane]);
+                control[2 * lane + 1] = static_cast<std::uint8_t>(2 * source[lane] + 1);
+            }
+        }
+
+        static MORVIK_INLINE Eighths<count> gather(const std::int16_t* slices,
+                                                   const std::uint32_t* from,
+                                                   const std::uint8_t* control)
+        {
+            typename Raw<count>::Signed shuffle;  // copied into an Eighths, it would go through memory
+            std::memcpy(&shuffle, control, sizeof shuffle);
+            using Group = Eighths<count / sources>;
+            const Group first = Group::load(slices + from[0]);
+            if constexpr (sources == 1) {
+                return shuffleBytes(first, Eighths<count>{shuffle});
+            } else {
+                const Group second = Group::load(slices + from[1]);
+                return shuffleBytes(inserted(first, second), Eighths<count>{shuffle});
+            }
+        }
+    };
+
+    /// The sixteen entries fit the sixteen bytes of a shuffle.
+    template <unsigned count>
+    class Table {
+    public:
+        explicit MORVIK_INLINE Table(const std::uint8_t* entries)
+        {
+            for (unsigned lane = 0; lane < count; ++lane) {
+                std::memcpy(reinterpret_cast<char*>(&itsEntries) + 2 * lane, entries + 2 * lane % 16, 2);
+            }
+        }
+
+        /// The entries at `index`, 0 to 15.
+        MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
+        {
+            // A byte shuffle gives 0 where the index byte's sign bit is set: the upper byte's.
+            return shuffleBytes(itsEntries, index | Eighths<count>::of(-0x8000));
+        }
+
+    private:
+        Eighths<count> itsEntries;
+    };
+};
+#endif
+
+// ---- AVX2: vectors of sixteen lanes
+
+#if defined(__AVX2__)
+/// Two vectors in one.
+MORVIK_INLINE Eighths<16> inserted(Eighths<8> a, Eighths<8> b)
+{
+    return {(Raw<16>::Signed)_mm256_set_m128i((__m128i)b.v, (__m128i)a.v)};
+}
+
+/// Within each sixteen bytes.
+MORVIK_INLINE Eighths<16> shuffleBytes(Eighths<16> a, Eighths<16> control)
+{
+    return {(Raw<16>::Signed)_mm256_shuffle_epi8((__m256i)a.v, (__m256i)control.v)};
+}
+
+struct Avx2 : Ssse3 {
+    using VectorLanes = std::integer_sequence<unsigned, 8, 16>;
+    using Kernels = Shapes<Shape<8, 1, 2>, Shape<16, 1>, Shape<16, 2>>;
+    static constexpr unsigned tileHalves = 2;
+
+    using Ssse3::scaledHalf;
+    static MORVIK_INLINE Eighths<16> scaledHalf(Eighths<16> a)
+    {
+        return {(Raw<16>::Signed)_mm256_mulhi_epi16((__m256i)a.v, _mm256_set1_epi16(3 << 13))};
+    }
+};
+#endif
+
+// ---- AVX-512: vectors of 32 lanes, 32 registers, permutations of whole vectors
+
+#if defined(__AVX512BW__) && defined(__AVX512VL__)
+MORVIK_INLINE Eighths<8> permuteWords(Eighths<8> a, Eighths<8> index)
+{
+    return {(Raw<8>::Signed)_mm_permutexvar_epi16((__m128i)index.v, (__m128i)a.v)};
+}
+
+MORVIK_INLINE Eighths<16> permuteWords(Eighths<16> a, Eighths<16> index)
+{
+    return {(Raw<16>::Signed)_mm256_permutexvar_epi16((__m256i)index.v, (__m256i)a.v)};
+}
+
+MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> index)
+{
+    return {(Raw<32>::Signed)_mm512_permutexvar_epi16((__m512i)index.v, (__m512i)a.v)};
+}
+
+struct Avx512 : Avx2 {
+    using VectorLanes = std::integer_sequence<unsigned, 8, 16, 32>;
+    using Kernels = Shapes<Shape<8, 1, 2>, Shape<16, 1>, Shape<32, 1>, Shape<32, 2>>;
+    static constexpr bool holdsTwoRecursions = sizeof(void*) == 8;  // 32-bit code has eight registers
+
+    /// An index word for each lane.
+    template <unsigned count>
+    struct Permutation {
+        static constexpr unsigned group = count;
+        static constexpr unsigned sources = 1;
+        static constexpr unsigned bytes = 2 * count;
+
+        static void prepare(const std::uint8_t* source, std::uint8_t* control)
+        {
+            for (unsigned lane = 0; lane < count; ++lane) {
+                control[2 * lane] = source[lane];
+                control[2 * lane + 1] = 0;
+            }
+        }
+
+        static MORVIK_INLINE Eighths<count> gather(const std::int16_t* slices,
+                                                   const std::uint32_t* from,
+                                                   const std::uint8_t* control)
+        {
+            typename Raw<count>::Signed index;
+            std::memcpy(&index, control, sizeof index);
+            return permuteWords(Eighths<count>::load(slices + *from), Eighths<count>{index});
+        }
+    };
+
+    /// An entry in each word.
+    template <unsigned count>
+    class WordTable {
+    public:
+        explicit MORVIK_INLINE WordTable(const std::uint8_t* entries)
+        {
+            for (unsigned lane = 0; lane < count; ++lane) {
+                itsEntries.v[lane] = entries[lane % 16];
+            }
+        }
+
+        /// The entries at `index`, 0 to 15.
+        MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
+        {
+            return permuteWords(itsEntries, index);
+        }
+
+    private:
+        Eighths<count> itsEntries;
+    };
+
+    template <unsigned count>
+    using Table = std::conditional_t<(count < 16), Avx2::Table<count>, WordTable<count>>;
+
+    using Avx2::scaledHalf;
+    static MORVIK_INLINE Eighths<32> scaledHalf(Eighths<32> a)
+    {
+        return {(Raw<32>::Signed)_mm512_mulhi_epi16((__m512i)a.v, _mm512_set1_epi16(3 << 13))};
+    }
+};
+#endif
+
+// ---- The one that this compilation is for
+
+#if defined(__AVX512BW__) && defined(__AVX512VL__)
+using Machine = Avx512;
+#elif defined(__AVX2__)
+using Machine = Avx2;
+#elif defined(__SSSE3__)
+using Machine = Ssse3;
+#elif defined(__SSE2__)
+using Machine = Sse2;
+#else
+using Machine = Portable;
+#endif
+
+}  // namespace morvik::lanes::MORVIK_LANES
+
+#endif
