@@ -1,7 +1,7 @@
 // Words: vectors of 16-bit words, the value type over which the lanes run the trellis.
 //
-// `Eighths` counts eighths, the unit of soft values and metrics. An aligned word has four bits below it, always 0;
-// without them, four bits are to spare, no metric wraps, and a plain maximum decides (Bounds.h proves it).
+// `Eighths` counts eighths, the unit of soft values and metrics. Aligned words have four bits below it, always 0. Here
+// these four are at the top instead: no metric wraps, and a plain maximum decides (Bounds.h proves it).
 //
 // Each instruction set compiles this text in a namespace of its own, MORVIK_LANES, so that nothing compiled for one
 // serves another.
