@@ -33,7 +33,7 @@ struct Options {
     DecoderOptions decoder;
 };
 
-void check(const doctor::Case& read, const SoftValueReader& blocks, const ReferenceBits& reference)
+void check(const diagnosis::Case& read, const SoftValueReader& blocks, const ReferenceBits& reference)
 {
     const std::size_t K = read.sent.size();
     if (rules::findBlockSize(static_cast<std::uint32_t>(K)) == nullptr) {
@@ -47,7 +47,7 @@ void check(const doctor::Case& read, const SoftValueReader& blocks, const Refere
 
 /// The cases to look at.
 struct Cases {
-    std::vector<doctor::Case> cases;
+    std::vector<diagnosis::Case> cases;
     bool hasMore = false;  ///< the file has more blocks
 };
 
@@ -57,10 +57,10 @@ Cases readCases(const Options& options)
     base::InputFile referenceFile(options.reference);
     SoftValueReader blocks(input.stream(), input.name());
     ReferenceBits reference(referenceFile.stream(), referenceFile.name());
-    std::vector<doctor::Case> cases;
+    std::vector<diagnosis::Case> cases;
     SoftBlock received;
     while (cases.size() < options.blocks && blocks.next(received)) {
-        doctor::Case read{received, {}};
+        diagnosis::Case read{received, {}};
         read.sent = reference.next();
         check(read, blocks, reference);
         cases.push_back(std::move(read));
@@ -75,19 +75,20 @@ int examine(const Options& options)
 {
     base::expectOwnFile(base::standardStream, {options.input, options.reference}, "findings");
     const Cases read = readCases(options);
-    doctor::Diagnosis diagnosis = doctor::diagnose(read.cases, options.decoder);
+    diagnosis::Diagnosis diagnosis = diagnosis::diagnose(read.cases, options.decoder);
     diagnosis.hasMore = read.hasMore;
     const std::string core = coreLine(options.decoder.generics, options.decoder.iterations);
     print(options.json ? jsonOf(diagnosis) : core + textOf(diagnosis));
     switch (diagnosis.verdict) {
-    case doctor::Verdict::healthy:
+    case diagnosis::Verdict::healthy:
         return success;
-    case doctor::Verdict::mistaken:
-    case doctor::Verdict::careless:
+    case diagnosis::Verdict::mistaken:
+    case diagnosis::Verdict::careless:
         return differencesFound;
     default:
-        return diagnosis.verdict != doctor::Verdict::unrelated && diagnosis.best.mistakes.count() > 0 ? differencesFound
-                                                                                                      : noMistakeFound;
+        return diagnosis.verdict != diagnosis::Verdict::unrelated && diagnosis.best.mistakes.count() > 0
+                   ? differencesFound
+                   : noMistakeFound;
     }
 }
 

@@ -10,7 +10,7 @@
 #include "lanes/Unaligned.h"
 #include "rules/Tail.h"
 
-namespace simulation_call {
+namespace morvik::simulation_call {
 
 /// A single call hands over a batch of one.
 struct Batch {
@@ -46,6 +46,6 @@ struct Batch {
     }
 };
 
-}  // namespace simulation_call
+}  // namespace morvik::simulation_call
 
 #endif

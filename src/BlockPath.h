@@ -15,15 +15,15 @@ public:
 
     /// Takes in blocks from block `first` on, at most `most` and at least 1; returns how many. Warns of a value that is
     /// clipped, and first of the tag of an earlier block. Exhausted memory throws std::bad_alloc.
-    virtual unsigned take(const simulation_call::Batch& batch, std::size_t first, unsigned most) = 0;
+    virtual unsigned take(const morvik::simulation_call::Batch& batch, std::size_t first, unsigned most) = 0;
 
-    virtual simulation_call::Status decode(unsigned iterations) = 0;
+    virtual morvik::simulation_call::Status decode(unsigned iterations) = 0;
 
     /// Decodes, and after each full iteration counts the decisions of each block that differ from `sent`. Both arrays
     /// begin with the first block that was taken.
-    virtual simulation_call::Status countErrors(unsigned iterations,
-                                                const std::uint8_t* sent,
-                                                std::uint32_t* errors) = 0;
+    virtual morvik::simulation_call::Status countErrors(unsigned iterations,
+                                                        const std::uint8_t* sent,
+                                                        std::uint32_t* errors) = 0;
 
     /// Decisions of each block.
     virtual std::size_t blockSize() const = 0;

@@ -8,7 +8,7 @@
 #include "CoreInputs.h"
 #include "PathChoice.h"
 
-using simulation_call::Status;
+using morvik::simulation_call::Status;
 
 namespace {
 
@@ -16,22 +16,22 @@ namespace {
 template <class Decode>
 Status decodeWith(veltra_ip_morvik_v1_0_state& state, Decode decode)
 {
-    return simulation_call::guarded([&] {
+    return morvik::simulation_call::guarded([&] {
         if (state.path_choice != nullptr) {
             state.path_choice->catchUp();
         }
-        return decode(*state.decoder) ? simulation_call::success : simulation_call::decodeFailed;
+        return decode(*state.decoder) ? morvik::simulation_call::success : morvik::simulation_call::decodeFailed;
     });
 }
 
 }  // namespace
 
-unsigned ComponentPath::take(const simulation_call::Batch& batch, std::size_t first, unsigned)
+unsigned ComponentPath::take(const morvik::simulation_call::Batch& batch, std::size_t first, unsigned)
 {
     itsBlockSize = batch.blockSize();
     itsSoft.clear();
     itsSoft.reserve(3 * static_cast<std::size_t>(batch.dinSize));
-    core_inputs::forEachSoftValue(itsState, batch, first, [&](unsigned, std::int32_t, std::int32_t integer) {
+    morvik::core_inputs::forEachSoftValue(itsState, batch, first, [&](unsigned, std::int32_t, std::int32_t integer) {
         itsSoft.push_back(itsState.state_format->place(integer));
     });
     return 1;
@@ -49,7 +49,7 @@ Status ComponentPath::countErrors(unsigned iterations, const std::uint8_t* sent,
     std::vector<unsigned long long> blockErrors;
     const Status status = decodeWith(
         itsState, [&](TDecoder& decoder) { return decoder.decode(itsSoft, reference, bitErrors, blockErrors); });
-    for (std::size_t t = 0; status == simulation_call::success && t < iterations; ++t) {
+    for (std::size_t t = 0; status == morvik::simulation_call::success && t < iterations; ++t) {
         morvik::lanes::setValueAt(errors, t, static_cast<std::uint32_t>(bitErrors[t]));
     }
     return status;

@@ -12,10 +12,12 @@ public:
     explicit ComponentPath(veltra_ip_morvik_v1_0_state& state) : itsState(state) {}
 
     /// Takes one block, and joins its three streams, position by position, into aligned soft values.
-    unsigned take(const simulation_call::Batch& batch, std::size_t first, unsigned most) override;
+    unsigned take(const morvik::simulation_call::Batch& batch, std::size_t first, unsigned most) override;
 
-    simulation_call::Status decode(unsigned iterations) override;
-    simulation_call::Status countErrors(unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors) override;
+    morvik::simulation_call::Status decode(unsigned iterations) override;
+    morvik::simulation_call::Status countErrors(unsigned iterations,
+                                                const std::uint8_t* sent,
+                                                std::uint32_t* errors) override;
     std::size_t blockSize() const override;
     void decisions(std::uint8_t* to) override;
     void ratios(std::int16_t* to) override;

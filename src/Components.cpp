@@ -3,7 +3,7 @@
 
 #include <string>
 
-namespace components {
+namespace morvik::components {
 
 namespace {
 
@@ -71,4 +71,4 @@ void release(State& state)
     releaseOne(state.decoder);
 }
 
-}  // namespace components
+}  // namespace morvik::components

@@ -4,7 +4,7 @@
 
 #include "DecoderState.h"
 
-namespace components {
+namespace morvik::components {
 
 using State = veltra_ip_morvik_v1_0_state;
 
@@ -14,6 +14,6 @@ const char* create(State& state);
 /// Releases a state's components and forgets them.
 void release(State& state);
 
-}  // namespace components
+}  // namespace morvik::components
 
 #endif

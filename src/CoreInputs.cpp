@@ -3,7 +3,7 @@
 
 #include "Messages.h"
 
-namespace core_inputs {
+namespace morvik::core_inputs {
 
 namespace {
 
@@ -34,4 +34,4 @@ void reportSaturation(State& state, unsigned stream, std::int32_t position, bool
     state.saturation_reported = true;
 }
 
-}  // namespace core_inputs
+}  // namespace morvik::core_inputs

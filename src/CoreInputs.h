@@ -11,7 +11,7 @@
 #include "lanes/Unaligned.h"
 #include "rules/SoftValues.h"
 
-namespace core_inputs {
+namespace morvik::core_inputs {
 
 using State = veltra_ip_morvik_v1_0_state;
 
@@ -45,6 +45,6 @@ void forEachSoftValue(State& state, const simulation_call::Batch& batch, std::si
     std::visit(convert, batch.streams);
 }
 
-}  // namespace core_inputs
+}  // namespace morvik::core_inputs
 
 #endif

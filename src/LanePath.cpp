@@ -5,8 +5,8 @@
 #include "TCalculationEngineModBase.h"
 #include "rules/Cut.h"
 
-using simulation_call::Batch;
-using simulation_call::Status;
+using morvik::simulation_call::Batch;
+using morvik::simulation_call::Status;
 
 namespace {
 
@@ -125,13 +125,13 @@ void LanePath::loadClipped(const Batch& batch, std::size_t first)
     blocks.resize(itsTaken);
     for (unsigned b = 0; b < itsTaken; ++b) {
         if (b > 0) {
-            core_inputs::truncateTag(itsState, batch.tag(first + b - 1));
+            morvik::core_inputs::truncateTag(itsState, batch.tag(first + b - 1));
         }
         std::int16_t* const to = values.data() + 3 * size * b;
         const auto keep = [&](unsigned stream, std::int32_t position, std::int32_t integer) {
             to[stream * size + static_cast<std::size_t>(position)] = static_cast<std::int16_t>(integer);
         };
-        core_inputs::forEachSoftValue(itsState, batch, first + b, keep);
+        morvik::core_inputs::forEachSoftValue(itsState, batch, first + b, keep);
         blocks[b] = {to, to + size, to + 2 * size};
     }
     itsLanes->load(blocks.data(), itsTaken);
@@ -141,7 +141,7 @@ Status LanePath::decode(unsigned iterations)
 {
     itsLanes->decode(0, 2 * iterations);
     count(iterations);
-    return simulation_call::success;
+    return morvik::simulation_call::success;
 }
 
 Status LanePath::countErrors(unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors)
@@ -156,7 +156,7 @@ Status LanePath::countErrors(unsigned iterations, const std::uint8_t* sent, std:
         }
     }
     count(iterations);
-    return simulation_call::success;
+    return morvik::simulation_call::success;
 }
 
 void LanePath::count(unsigned iterations)

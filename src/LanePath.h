@@ -26,9 +26,11 @@ public:
     const morvik::lanes::InstructionSet& instructionSet() const;
     void setInstructionSet(const morvik::lanes::InstructionSet& instructionSet);
 
-    unsigned take(const simulation_call::Batch& batch, std::size_t first, unsigned most) override;
-    simulation_call::Status decode(unsigned iterations) override;
-    simulation_call::Status countErrors(unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors) override;
+    unsigned take(const morvik::simulation_call::Batch& batch, std::size_t first, unsigned most) override;
+    morvik::simulation_call::Status decode(unsigned iterations) override;
+    morvik::simulation_call::Status countErrors(unsigned iterations,
+                                                const std::uint8_t* sent,
+                                                std::uint32_t* errors) override;
     std::size_t blockSize() const override;
     void decisions(std::uint8_t* to) override;
     void ratios(std::int16_t* to) override;
@@ -45,11 +47,11 @@ private:
 
     void prepare(unsigned K);
     template <class Input>
-    bool load(const simulation_call::Batch& batch,
+    bool load(const morvik::simulation_call::Batch& batch,
               const morvik::lanes::Streams<Input>& all,
               std::size_t first,
               unsigned most);
-    void loadClipped(const simulation_call::Batch& batch, std::size_t first);
+    void loadClipped(const morvik::simulation_call::Batch& batch, std::size_t first);
     void count(unsigned iterations);
 
     veltra_ip_morvik_v1_0_state& itsState;

@@ -4,7 +4,7 @@
 
 #include "Messages.h"
 
-namespace messages {
+namespace morvik::messages {
 
 std::ostream& output()
 {
@@ -16,4 +16,4 @@ std::ostream& error()
     return std::cerr;
 }
 
-}  // namespace messages
+}  // namespace morvik::messages

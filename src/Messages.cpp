@@ -1,7 +1,7 @@
 // Messages: how a line is put together and written.
 #include "Messages.h"
 
-namespace messages {
+namespace morvik::messages {
 
 void LineBuffer::add(std::string_view text)
 {
@@ -28,4 +28,4 @@ void LineBuffer::writeOut()
     itsSize = 0;
 }
 
-}  // namespace messages
+}  // namespace morvik::messages

@@ -12,7 +12,7 @@
 #include <string_view>
 #include <type_traits>
 
-namespace messages {
+namespace morvik::messages {
 
 /// The stream that carries warnings and traces: the process's standard output (MessageStreams.cpp).
 std::ostream& output();
@@ -112,6 +112,6 @@ void writeWarning(const Parts&... parts) noexcept
     writeMessage(output(), parts...);
 }
 
-}  // namespace messages
+}  // namespace morvik::messages
 
 #endif

@@ -67,7 +67,7 @@ void readParameters(std::istream& stream,
         const auto [left, right] = splitString(content, "=");
         const std::string name = stripws(left);
         if (checkNames && parameters.count(name) == 0) {
-            messages::writeError("ERROR:", lineNumber, ":Parameter name '", name, "' is invalid");
+            morvik::messages::writeError("ERROR:", lineNumber, ":Parameter name '", name, "' is invalid");
             allNamesValid = false;
             continue;
         }
@@ -177,7 +177,7 @@ bool parse(const std::string& fileName, std::map<std::string, std::string>& para
 {
     std::ifstream file(fileName);
     if (!file) {
-        messages::writeError("ERROR:Could not open input file '", fileName, "'");
+        morvik::messages::writeError("ERROR:Could not open input file '", fileName, "'");
         return false;
     }
     makePlain(file);

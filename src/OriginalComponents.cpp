@@ -194,7 +194,7 @@ TDecoder3GPU& OriginalComponents::twin()
     if (itsTwin == nullptr) {
         std::unique_ptr<State, Release> made(new State{});
         made->generics = itsGenerics;
-        components::create(*made);
+        morvik::components::create(*made);
         itsTwin = std::move(made);
     }
     return static_cast<TDecoder3GPU&>(*itsTwin->decoder);
@@ -202,6 +202,6 @@ TDecoder3GPU& OriginalComponents::twin()
 
 void OriginalComponents::Release::operator()(State* state) const
 {
-    components::release(*state);
+    morvik::components::release(*state);
     delete state;
 }

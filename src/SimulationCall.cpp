@@ -10,7 +10,7 @@
 #include "LanePath.h"
 #include "PathChoice.h"
 
-namespace simulation_call {
+namespace morvik::simulation_call {
 
 namespace {
 
@@ -173,4 +173,4 @@ Status countErrors(State* state, const Batch& batch, const ErrorCounts& counts)
     });
 }
 
-}  // namespace simulation_call
+}  // namespace morvik::simulation_call

@@ -10,7 +10,7 @@
 #include "Status.h"
 #include "morvik_v1_0_batch.h"
 
-namespace simulation_call {
+namespace morvik::simulation_call {
 
 /// What was sent, and where the counts of wrong decisions go.
 struct ErrorCounts {
@@ -24,6 +24,6 @@ struct ErrorCounts {
 Status simulate(veltra_ip_morvik_v1_0_state* state, const Batch& batch, veltra_ip_morvik_v1_0_batch_outputs* outputs);
 Status countErrors(veltra_ip_morvik_v1_0_state* state, const Batch& batch, const ErrorCounts& counts);
 
-}  // namespace simulation_call
+}  // namespace morvik::simulation_call
 
 #endif

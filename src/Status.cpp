@@ -3,7 +3,7 @@
 
 #include "Messages.h"
 
-namespace simulation_call {
+namespace morvik::simulation_call {
 
 Status refuse(const char* reason)
 {
@@ -11,4 +11,4 @@ Status refuse(const char* reason)
     return refused;
 }
 
-}  // namespace simulation_call
+}  // namespace morvik::simulation_call

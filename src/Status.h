@@ -4,7 +4,7 @@
 
 #include <cstdint>
 
-namespace simulation_call {
+namespace morvik::simulation_call {
 
 enum Status : std::int32_t { success = 0, refused = 1, decodeFailed = 2, exceptionRaised = 99 };
 
@@ -23,6 +23,6 @@ auto guarded(Part part) -> decltype(part())
     }
 }
 
-}  // namespace simulation_call
+}  // namespace morvik::simulation_call
 
 #endif

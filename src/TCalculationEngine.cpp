@@ -12,7 +12,7 @@ bool TCalculationEngine::initialise()
 {
     const int mask = itsStateFormat->itsMask;
     if (mask == mask / 2) {
-        messages::writeWarning(
+        morvik::messages::writeWarning(
             "WARNING:The state number format is set to maximum bit width. "
             "Note that this will cause a 1-bit truncation during intrinsic calculations");
     }
@@ -28,7 +28,7 @@ TCalculationEngine* TCalculationEngine::create(const std::string& s)
     if (type == "MOD#") {
         return TCalculationEngineModHash::create(properties);
     }
-    messages::writeError("ERROR:TCalculationEngine:Unrecognised type:", type);
+    morvik::messages::writeError("ERROR:TCalculationEngine:Unrecognised type:", type);
     return nullptr;
 }
 

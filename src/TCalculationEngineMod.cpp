@@ -6,7 +6,7 @@
 TCalculationEngine* TCalculationEngineMod::create(const std::string& p)
 {
     if (!p.empty()) {
-        messages::writeError("ERROR:TCalculationEngineMod:Unexpected properties:", p);
+        morvik::messages::writeError("ERROR:TCalculationEngineMod:Unexpected properties:", p);
         return nullptr;
     }
     return new TCalculationEngineMod();

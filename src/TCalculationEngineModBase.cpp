@@ -107,7 +107,7 @@ Result* runVariant(const TCalculationEngineModBase& engine,
         return nullptr;
     }
     if (type < TCalculationEngineModBase::MOD || type > TCalculationEngineModBase::MOD_HASH) {
-        messages::writeError("ERROR:TCalculationEngineModBase::", kernel, ":Illegal algorithm type");
+        morvik::messages::writeError("ERROR:TCalculationEngineModBase::", kernel, ":Illegal algorithm type");
         return nullptr;
     }
     return (engine.*variants[type - TCalculationEngineModBase::MOD])(arguments...);
@@ -229,7 +229,7 @@ std::vector<unsigned char> TCalculationEngineModBase::createLUT(unsigned points,
 {
     const std::uint32_t fractionAndShift = stateFormat.itsBinPt + stateFormat.itsShift;
     if (fractionAndShift >= 9) {
-        messages::writeError(
+        morvik::messages::writeError(
             "ERROR:TCalculationEngineModBase::createLUT:Binary point of state metrics is incompatible with "
             "8 bit lookup tables");
         return {};
@@ -240,7 +240,8 @@ std::vector<unsigned char> TCalculationEngineModBase::createLUT(unsigned points,
         ++log2Range;
     }
     if ((std::uint64_t{1} << log2Range) != range) {
-        messages::writeError("ERROR:TCalculationEngineModBase::createLUT:Number of points must be a binary number");
+        morvik::messages::writeError(
+            "ERROR:TCalculationEngineModBase::createLUT:Number of points must be a binary number");
         return {};
     }
     const std::uint32_t ignored = fractionAndShift - rules::resolvedFractionBits(stateFormat.itsBinPt, log2Range);
@@ -298,9 +299,10 @@ void dumpGamma(std::ostream& os,
                const T8* g2,
                const TNumberFormat& format)
 {
-    messages::writeLine(os,
-                        "n    intrinsic   parity0     parity1        g1[0]        g1[1]        g1[2]        g1[3]  "
-                        "        g2[0]        g2[1]        g2[2]        g2[3]");
+    morvik::messages::writeLine(
+        os,
+        "n    intrinsic   parity0     parity1        g1[0]        g1[1]        g1[2]        g1[3]  "
+        "        g2[0]        g2[1]        g2[2]        g2[3]");
     TraceRow row(format);
     for (unsigned k = 0; k < n; ++k) {
         row.begin(k);
@@ -317,10 +319,11 @@ void dumpGamma(std::ostream& os,
 
 void dumpAlphaBeta(std::ostream& os, unsigned n, const T8* g, const T8* ab1, const T8* ab2, const TNumberFormat& format)
 {
-    messages::writeLine(os,
-                        "n    g4          g5          g6          g7             ab1[0]       ab1[1]       ab1[2]   "
-                        "    ab1[3]       ab1[4]       ab1[5]       ab1[6]       ab1[7]         ab2[0]       ab2[1]  "
-                        "     ab2[2]       ab2[3]       ab2[4]       ab2[5]       ab2[6]       ab2[7]");
+    morvik::messages::writeLine(
+        os,
+        "n    g4          g5          g6          g7             ab1[0]       ab1[1]       ab1[2]   "
+        "    ab1[3]       ab1[4]       ab1[5]       ab1[6]       ab1[7]         ab2[0]       ab2[1]  "
+        "     ab2[2]       ab2[3]       ab2[4]       ab2[5]       ab2[6]       ab2[7]");
     TraceRow row(format);
     for (unsigned k = 0; k < n; ++k) {
         row.begin(k);
@@ -342,10 +345,11 @@ void dumpExtrinsic(std::ostream& os,
                    const short* e2,
                    const TNumberFormat& format)
 {
-    messages::writeLine(os,
-                        "n    a[0]        a[1]        a[2]        a[3]        a[4]        a[5]        a[6]        "
-                        "a[7]          b[0]        b[1]        b[2]        b[3]        b[4]        b[5]        b[6]  "
-                        "      b[7]          g[4]        g[5]        g[6]        g[7]           e1           e2");
+    morvik::messages::writeLine(
+        os,
+        "n    a[0]        a[1]        a[2]        a[3]        a[4]        a[5]        a[6]        "
+        "a[7]          b[0]        b[1]        b[2]        b[3]        b[4]        b[5]        b[6]  "
+        "      b[7]          g[4]        g[5]        g[6]        g[7]           e1           e2");
     TraceRow row(format);
     for (unsigned k = 0; k < n; ++k) {
         row.begin(k);

@@ -17,7 +17,7 @@ TCalculationEngine* TCalculationEngineModHash::create(const std::string& p)
         text.imbue(std::locale::classic());
         text >> points;
         if (text.fail()) {
-            messages::writeError("ERROR:TCalculationEngineModHash:Illegal number of points");
+            morvik::messages::writeError("ERROR:TCalculationEngineModHash:Illegal number of points");
             return nullptr;
         }
     }

@@ -75,7 +75,7 @@ TDecoder* TDecoder::create(const std::string& properties)
     if (type == "3GPPPU") {
         return TDecoder3GPU::create(false, rest);
     }
-    messages::writeError("ERROR:TDecoder:Unrecognised type:", type);
+    morvik::messages::writeError("ERROR:TDecoder:Unrecognised type:", type);
     return nullptr;
 }
 
@@ -100,10 +100,10 @@ bool TDecoder::checkDump(unsigned int halfIteration)
     if (itsDumpCount == 0) {
         return true;
     }
-    dumpFull(messages::output(), halfIteration);
+    dumpFull(morvik::messages::output(), halfIteration);
     --itsDumpCount;
     if (itsDumpCount == 0 && itsStopAfterDump) {
-        messages::writeError("STOP:Dump complete");
+        morvik::messages::writeError("STOP:Dump complete");
         return false;
     }
     return true;

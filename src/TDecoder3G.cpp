@@ -21,17 +21,17 @@ constexpr const char* tableHeader =
 /// One line of the input dump: "label[d]=[" and the values with single blanks between them.
 void dumpStream(std::ostream& out, const char* label, unsigned d, const std::vector<short>& values)
 {
-    messages::writePart(out, label);
-    messages::writePart(out, '[');
-    messages::writePart(out, d);
-    messages::writePart(out, "]=[");
+    morvik::messages::writePart(out, label);
+    morvik::messages::writePart(out, '[');
+    morvik::messages::writePart(out, d);
+    morvik::messages::writePart(out, "]=[");
     const char* separator = "";
     for (const short value : values) {
-        messages::writePart(out, separator);
-        messages::writePart(out, value);
+        morvik::messages::writePart(out, separator);
+        morvik::messages::writePart(out, value);
         separator = " ";
     }
-    messages::writeLine(out, ']');
+    morvik::messages::writeLine(out, ']');
 }
 
 }  // namespace
@@ -41,7 +41,7 @@ TDecoder3G::TDecoder3G(bool layout3GPP2) : is3GPP2(layout3GPP2) {}
 TDecoder* TDecoder3G::create(bool layout3GPP2, const std::string& properties)
 {
     if (!properties.empty()) {
-        messages::writeError("ERROR:TDecoder3G:Unexpected properties ", properties);
+        morvik::messages::writeError("ERROR:TDecoder3G:Unexpected properties ", properties);
         return nullptr;
     }
     return new TDecoder3G(layout3GPP2);
@@ -110,7 +110,8 @@ bool TDecoder3G::extract(const std::vector<short>& soft)
     const std::size_t valuesPerBit = is3GPP2 ? 5 : 3;
     const std::size_t tailValues = std::size_t{2} * tailSteps * streamsPerDecoder;
     if (soft.size() < tailValues || (soft.size() - tailValues) % valuesPerBit != 0) {
-        messages::writeError("ERROR:TDecoder3G:Number of soft inputs does not match rate and number of tail bits");
+        morvik::messages::writeError(
+            "ERROR:TDecoder3G:Number of soft inputs does not match rate and number of tail bits");
         return false;
     }
     const auto K = static_cast<unsigned>((soft.size() - tailValues) / valuesPerBit);
@@ -147,7 +148,7 @@ void TDecoder3G::appendParity(unsigned d, InputPosition& next)
 bool TDecoder3G::interleaveSystematic(unsigned K)
 {
     if (!preparePermutation(1, K)) {
-        messages::writeError("ERROR:TDecoder3G:Block size not supported");
+        morvik::messages::writeError("ERROR:TDecoder3G:Block size not supported");
         return false;
     }
     for (unsigned i = 0; i < K; ++i) {
@@ -191,7 +192,7 @@ bool TDecoder3G::startExtrinsic()
         return true;
     }
     if (itsExtrinsicIn.size() != itsBlockSize) {
-        messages::writeError("ERROR:TDecoder3G:Number of soft extrinsic inputs does not match block size");
+        morvik::messages::writeError("ERROR:TDecoder3G:Number of soft extrinsic inputs does not match block size");
         return false;
     }
     const short mask = itsEngine->itsStateFormat->itsMask;
@@ -303,8 +304,8 @@ void TDecoder3G::dump(std::ostream&) {}
 
 void TDecoder3G::dumpInput() const
 {
-    std::ostream& out = messages::output();
-    messages::writeLine(out, std::string(120, '-'));
+    std::ostream& out = morvik::messages::output();
+    morvik::messages::writeLine(out, std::string(120, '-'));
     for (const unsigned d : {0U, 1U}) {
         dumpStream(out, "itsSys ", d, itsSys[d]);
         dumpStream(out, "itsPar0", d, itsPar0[d]);
@@ -314,9 +315,9 @@ void TDecoder3G::dumpInput() const
 
 void TDecoder3G::dumpFull(std::ostream& out, unsigned int halfIteration)
 {
-    messages::writeLine(out, std::string(289, '-'));
-    messages::writeLine(out, "decode=", itsDecodeCount, " siso=", halfIteration);
-    messages::writeLine(out, tableHeader);
+    morvik::messages::writeLine(out, std::string(289, '-'));
+    morvik::messages::writeLine(out, "decode=", itsDecodeCount, " siso=", halfIteration);
+    morvik::messages::writeLine(out, tableHeader);
     TraceRow row(*itsEngine->itsStateFormat);
     for (unsigned n = 0; n < itsBlockSize; ++n) {
         row.begin(n);

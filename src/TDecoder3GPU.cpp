@@ -36,7 +36,7 @@ bool readNumber(std::istream& text, const char* what, std::uint32_t& number)
 {
     text >> number;
     if (text.fail() || number == 0) {
-        messages::writeError("ERROR:TDecoder3GPU:Illegal number of ", what, ":", number);
+        morvik::messages::writeError("ERROR:TDecoder3GPU:Illegal number of ", what, ":", number);
         return false;
     }
     return true;
@@ -68,7 +68,7 @@ std::string text(const std::vector<TDecoder3GPU::ABSegment>& segments)
 void traceStarts(const char* label, const std::vector<T8>& starts)
 {
     for (std::size_t i = 0; i < starts.size(); ++i) {
-        messages::writeLine(messages::output(), label, i, "]=", text(starts[i]));
+        morvik::messages::writeLine(morvik::messages::output(), label, i, "]=", text(starts[i]));
     }
 }
 
@@ -129,10 +129,10 @@ bool TDecoder3GPU::buildSegments(std::uint32_t K)
     const rules::Cut cut(K, itsNumPU, itsThreadsPerPU);
     itsNT = cut.segments();
     if (itsTraceLevel > 0) {
-        messages::writeLine(messages::output(), "itsNT=", itsNT);
+        morvik::messages::writeLine(morvik::messages::output(), "itsNT=", itsNT);
     }
     if (!cut.dividesEvenly()) {
-        messages::writeError("ERROR:TDecoder3GPU:Block size not supported");
+        morvik::messages::writeError("ERROR:TDecoder3GPU:Block size not supported");
         return false;
     }
     std::vector<ABSegment> segments;
@@ -147,8 +147,8 @@ bool TDecoder3GPU::buildSegments(std::uint32_t K)
     itsAlphaSegment = std::move(segments);
     itsBetaSegment = std::move(windows);
     if (itsTraceLevel > traceSegments) {
-        messages::writeLine(messages::output(), "itsAlphaSegment=", text(itsAlphaSegment));
-        messages::writeLine(messages::output(), "itsBetaSegment =", text(itsBetaSegment));
+        morvik::messages::writeLine(morvik::messages::output(), "itsAlphaSegment=", text(itsAlphaSegment));
+        morvik::messages::writeLine(morvik::messages::output(), "itsBetaSegment =", text(itsBetaSegment));
     }
     return true;
 }
@@ -164,7 +164,7 @@ bool TDecoder3GPU::calcAlpha(unsigned int h)
     std::vector<T8>& starts = itsAlphaInit[constituent(h)];
     const bool traced = itsTraceLevel > traceColumns;
     if (traced) {
-        messages::writeLine(messages::output(), "TDecoder3GPU::calcAlpha(", h, ")");
+        morvik::messages::writeLine(morvik::messages::output(), "TDecoder3GPU::calcAlpha(", h, ")");
     }
     if (rules::isFirstPass(h)) {
         initialiseAlpha(h);
@@ -176,8 +176,15 @@ bool TDecoder3GPU::calcAlpha(unsigned int h)
         itsAlpha[from] = start;
         starts[u] = border(reached);
         if (traced) {
-            messages::writeLine(
-                messages::output(), "from=", from, " to=", to, " init=", text(start), " newinit=", text(starts[u]));
+            morvik::messages::writeLine(morvik::messages::output(),
+                                        "from=",
+                                        from,
+                                        " to=",
+                                        to,
+                                        " init=",
+                                        text(start),
+                                        " newinit=",
+                                        text(starts[u]));
         }
         if (!calcAlpha(h, from, to)) {
             return false;
@@ -204,7 +211,7 @@ bool TDecoder3GPU::calcBeta(unsigned int h)
     std::vector<T8>& starts = itsBetaInit[constituent(h)];
     const bool traced = itsTraceLevel > traceColumns;
     if (traced) {
-        messages::writeLine(messages::output(), "TDecoder3GPU::calcBeta(", h, ")");
+        morvik::messages::writeLine(morvik::messages::output(), "TDecoder3GPU::calcBeta(", h, ")");
     }
     if (rules::isFirstPass(h)) {
         initialiseBeta(h);
@@ -250,8 +257,15 @@ bool TDecoder3GPU::runWindow(unsigned int h, std::size_t i, const T8& start)
     }
     const T8 reached = itsBeta[to];
     if (itsTraceLevel > traceColumns) {
-        messages::writeLine(
-            messages::output(), "from=", from, " to=", to, " beta[from]=", text(start), " beta[to]=", text(reached));
+        morvik::messages::writeLine(morvik::messages::output(),
+                                    "from=",
+                                    from,
+                                    " to=",
+                                    to,
+                                    " beta[from]=",
+                                    text(start),
+                                    " beta[to]=",
+                                    text(reached));
     }
     if (i == 0) {
         return true;  // the block's first window ends at its own first step: nobody starts from there
@@ -261,7 +275,7 @@ bool TDecoder3GPU::runWindow(unsigned int h, std::size_t i, const T8& start)
     stored = border(reached);
     itsBeta[to] = neighbours;
     if (itsTraceLevel > traceColumns) {
-        messages::writeLine(messages::output(), " init[", entry, "]=", text(stored));
+        morvik::messages::writeLine(morvik::messages::output(), " init[", entry, "]=", text(stored));
     }
     return true;
 }

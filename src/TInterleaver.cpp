@@ -32,7 +32,7 @@ TInterleaver* TInterleaver::create(const std::string& properties)
     if (type == "3GPPLTE") {
         return TInterleaver3GPPLTE::create(props);
     }
-    messages::writeError("ERROR:TInterleaver:Unrecognised type:", type);
+    morvik::messages::writeError("ERROR:TInterleaver:Unrecognised type:", type);
     return nullptr;
 }
 
@@ -43,23 +43,23 @@ std::vector<std::string> TInterleaver::getNames()
 
 void TInterleaver::dumpAll(unsigned first, unsigned last, bool showSize)
 {
-    std::ostream& os = messages::output();
+    std::ostream& os = morvik::messages::output();
     if (first > last) {
         return;
     }
     for (unsigned K = first;; ++K) {
         if (valid(K)) {
             if (showSize) {
-                messages::writePart(os, K);
-                messages::writePart(os, ": ");
+                morvik::messages::writePart(os, K);
+                morvik::messages::writePart(os, ": ");
             }
             if (itsPi.size() != K) {
                 calcInterleaver(itsPi, K);
             }
             const char* separator = "";
             for (const unsigned position : itsPi) {
-                messages::writePart(os, separator);
-                messages::writePart(os, position);
+                morvik::messages::writePart(os, separator);
+                morvik::messages::writePart(os, position);
                 separator = " ";
             }
             os.put('\n');

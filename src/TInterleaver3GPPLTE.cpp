@@ -9,7 +9,7 @@ namespace rules = morvik::rules;
 TInterleaver* TInterleaver3GPPLTE::create(const std::string& props)
 {
     if (!props.empty()) {
-        messages::writeError("ERROR:TInterleaver3GPPLTE:Unexpected properties:", props);
+        morvik::messages::writeError("ERROR:TInterleaver3GPPLTE:Unexpected properties:", props);
         return nullptr;
     }
     return new TInterleaver3GPPLTE();

@@ -16,7 +16,7 @@ namespace {
 
 TNumberFormat* refuse(const std::string& properties)
 {
-    messages::writeError("ERROR:TNumberFormat:Unexpected property string:", properties);
+    morvik::messages::writeError("ERROR:TNumberFormat:Unexpected property string:", properties);
     return nullptr;
 }
 
@@ -54,11 +54,11 @@ TNumberFormat* TNumberFormat::create(const std::string& properties)
         return refuse(properties);
     }
     if (nbits < 1 || nbits > 16) {
-        messages::writeError("ERROR:TNumberFormat:nbits must be in range [1:16]");
+        morvik::messages::writeError("ERROR:TNumberFormat:nbits must be in range [1:16]");
         return nullptr;
     }
     if (binpt < 1 || binpt > 16 || binpt >= nbits) {
-        messages::writeError("ERROR:TNumberFormat:binpt must be in range [1:16] and <nbits");
+        morvik::messages::writeError("ERROR:TNumberFormat:binpt must be in range [1:16] and <nbits");
         return nullptr;
     }
     return new TNumberFormat(nbits, binpt);

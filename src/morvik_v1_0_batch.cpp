@@ -11,7 +11,7 @@
 
 namespace {
 
-using namespace simulation_call;
+using namespace morvik::simulation_call;
 using morvik::byComponents;
 using Outputs = veltra_ip_morvik_v1_0_batch_outputs;
 using State = veltra_ip_morvik_v1_0_state;
@@ -48,7 +48,7 @@ Status setInstructionSet(State& state, std::string_view wanted)
         }
         return success;
     }
-    messages::writeError("ERROR:decoder:Instruction set '", wanted, "' is not one of ", known, byComponents);
+    morvik::messages::writeError("ERROR:decoder:Instruction set '", wanted, "' is not one of ", known, byComponents);
     return refused;
 }
 

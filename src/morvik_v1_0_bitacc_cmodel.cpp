@@ -13,7 +13,7 @@
 namespace {
 
 using Generics = veltra_ip_morvik_v1_0_generics;
-using namespace simulation_call;
+using namespace morvik::simulation_call;
 using State = veltra_ip_morvik_v1_0_state;
 
 /// What is wrong with the generics, or null.
@@ -46,7 +46,7 @@ const char* checkGenerics(const Generics& generics)
 /// Builds what a state consists of; null, or what failed.
 const char* build(State& state)
 {
-    if (const char* reason = components::create(state)) {
+    if (const char* reason = morvik::components::create(state)) {
         return reason;
     }
     state.path_choice = new PathChoice(state, morvik::lanes::bestInstructionSet());
@@ -76,7 +76,7 @@ veltra_ip_morvik_v1_0_state* create_default_state(veltra_ip_morvik_v1_0_generics
 {
     auto* state = static_cast<State*>(std::malloc(sizeof(State)));
     if (state == nullptr) {
-        messages::writeError("ERROR:decoder:Could not allocate memory for decoder state");
+        morvik::messages::writeError("ERROR:decoder:Could not allocate memory for decoder state");
         return nullptr;
     }
     *state = State{};
@@ -116,7 +116,7 @@ void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state* state)
         return;
     }
     delete state->path_choice;
-    components::release(*state);
+    morvik::components::release(*state);
     std::free(state);
 }
 

@@ -79,36 +79,36 @@ std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Va
 }
 
 /// One mistake at a time, of those that leave a block of this size.
-std::vector<doctor::Mistakes> allMistakes()
+std::vector<diagnosis::Mistakes> allMistakes()
 {
-    std::vector<doctor::Mistakes> all;
+    std::vector<diagnosis::Mistakes> all;
     const auto add = [&all](auto member, auto value) {
         all.emplace_back();
         all.back().*member = value;
     };
     for (unsigned columns = 1; columns < 8; ++columns) {
-        add(&doctor::Mistakes::flipped, columns);
+        add(&diagnosis::Mistakes::flipped, columns);
     }
-    for (std::size_t i = 1; i < doctor::columnContents.size(); ++i) {
-        add(&doctor::Mistakes::columns, i);
+    for (std::size_t i = 1; i < diagnosis::columnContents.size(); ++i) {
+        add(&diagnosis::Mistakes::columns, i);
     }
-    for (std::size_t i = 1; i < doctor::tailContents.size(); ++i) {
-        add(&doctor::Mistakes::tail, i);
+    for (std::size_t i = 1; i < diagnosis::tailContents.size(); ++i) {
+        add(&diagnosis::Mistakes::tail, i);
     }
     for (const int doublings : {-3, -2, -1, 1, 2, 3}) {
-        add(&doctor::Mistakes::doublings, doublings);
+        add(&diagnosis::Mistakes::doublings, doublings);
     }
-    add(&doctor::Mistakes::order, doctor::Order::rowsReversed);
-    add(&doctor::Mistakes::order, doctor::Order::dataReversed);
+    add(&diagnosis::Mistakes::order, diagnosis::Order::rowsReversed);
+    add(&diagnosis::Mistakes::order, diagnosis::Order::dataReversed);
     return all;
 }
 
 std::vector<std::string> findMistakes(const ComparedRun& run, const comparison::Values& dump)
 {
     std::vector<std::string> found;
-    for (const doctor::Mistakes& mistakes : allMistakes()) {
-        if (comparison::computesAll(doctor::undone({run.block, {}}, mistakes).received, run.generics, dump)) {
-            found.push_back("if, in the block, " + doctor::explain(mistakes).front().what);
+    for (const diagnosis::Mistakes& mistakes : allMistakes()) {
+        if (comparison::computesAll(diagnosis::undone({run.block, {}}, mistakes).received, run.generics, dump)) {
+            found.push_back("if, in the block, " + diagnosis::explain(mistakes).front().what);
         }
     }
     return found;

@@ -8,7 +8,7 @@
 #include "Trial.h"
 #include "rules/Tail.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 namespace {
 
@@ -274,4 +274,4 @@ Diagnosis diagnose(const std::vector<Case>& cases, const DecoderOptions& options
     return Examination(cases, options).run();
 }
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis

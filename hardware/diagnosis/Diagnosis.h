@@ -11,7 +11,7 @@
 #include "Mistakes.h"
 #include "hardware/testbench/DecoderOptions.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 /// What comes of the blocks once some mistakes are undone.
 struct Attempt {
@@ -58,6 +58,6 @@ struct Diagnosis {
 /// no case has fewer rows than bits.
 Diagnosis diagnose(const std::vector<Case>& cases, const DecoderOptions& options);
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis
 
 #endif

@@ -6,7 +6,7 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 namespace {
 
@@ -244,4 +244,4 @@ std::string jsonOf(const Diagnosis& diagnosis)
     return object.dump(2) + '\n';
 }
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis

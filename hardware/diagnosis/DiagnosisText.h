@@ -6,7 +6,7 @@
 
 #include "Diagnosis.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 /// What was tried, what was found, and what to change; lines.
 std::string textOf(const Diagnosis& diagnosis);
@@ -14,6 +14,6 @@ std::string textOf(const Diagnosis& diagnosis);
 /// The same as a JSON object, with all that was tried; lines.
 std::string jsonOf(const Diagnosis& diagnosis);
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis
 
 #endif

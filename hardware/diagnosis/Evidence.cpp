@@ -7,7 +7,7 @@
 #include "link/TurboEncoder.h"
 #include "rules/BlockSizes.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 namespace {
 
@@ -218,4 +218,4 @@ std::array<std::vector<std::uint8_t>, 3> encoded(const std::vector<std::uint8_t>
     return streams;
 }
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis

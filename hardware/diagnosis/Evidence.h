@@ -13,7 +13,7 @@
 
 #include "Mistakes.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 /// Signs that contradict the bits; a value of 0 is half a contradiction.
 struct Signs {
@@ -67,6 +67,6 @@ Appearance appearanceOf(const std::vector<Case>& cases);
 /// The streams of a block's code word, tail included.
 std::array<std::vector<std::uint8_t>, 3> encoded(const std::vector<std::uint8_t>& bits);
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis
 
 #endif

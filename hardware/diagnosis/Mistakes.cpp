@@ -5,7 +5,7 @@
 #include <cmath>
 #include <cstdlib>
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 namespace {
 
@@ -281,4 +281,4 @@ Case undone(const Case& block, const Mistakes& mistakes)
     return right;
 }
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis

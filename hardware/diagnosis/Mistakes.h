@@ -10,7 +10,7 @@
 
 #include "hardware/testbench/SoftBlock.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 /// A block as a file has it, and the bits that are said to have been sent.
 struct Case {
@@ -92,6 +92,6 @@ void restoreOrder(Case& block, Order order);
 /// The case as it should have been, K + 4 rows and K bits.
 Case undone(const Case& block, const Mistakes& mistakes);
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis
 
 #endif

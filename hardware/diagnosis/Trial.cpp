@@ -6,7 +6,7 @@
 
 #include "simulation/FrameSimulator.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 Trial::Trial(const DecoderOptions& options)
     : itsSilence(nullptr), itsDecoder(options.generics, itsSilence), itsIterations(options.iterations)
@@ -53,4 +53,4 @@ std::uint32_t simulatedFailures(
         std::count_if(result.wrongBits.begin(), result.wrongBits.end(), [](std::uint32_t wrong) { return wrong > 0; }));
 }
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis

@@ -11,7 +11,7 @@
 #include "hardware/testbench/Decoder.h"
 #include "hardware/testbench/DecoderOptions.h"
 
-namespace morvik::doctor {
+namespace morvik::diagnosis {
 
 class Trial {
 public:
@@ -37,6 +37,6 @@ private:
 std::uint32_t simulatedFailures(
     const DecoderOptions& options, unsigned K, double ebn0, double scale, std::uint32_t blocks);
 
-}  // namespace morvik::doctor
+}  // namespace morvik::diagnosis
 
 #endif

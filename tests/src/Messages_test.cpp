@@ -39,9 +39,10 @@ protected:
 TEST(Messages, ComposesALineOfTextsCharactersAndIntegers)
 {
     std::ostringstream os;
-    messages::writeLine(os, "a", std::string("b "), 'c', 0U, ' ', short{-7}, ' ', (std::uint8_t{200}));
-    messages::writeLine(os, std::numeric_limits<std::int64_t>::min(), ' ', std::numeric_limits<std::uint64_t>::max());
-    messages::writeLine(os);
+    morvik::messages::writeLine(os, "a", std::string("b "), 'c', 0U, ' ', short{-7}, ' ', (std::uint8_t{200}));
+    morvik::messages::writeLine(
+        os, std::numeric_limits<std::int64_t>::min(), ' ', std::numeric_limits<std::uint64_t>::max());
+    morvik::messages::writeLine(os);
     EXPECT_EQ(os.str(), "ab c0 -7 200\n-9223372036854775808 18446744073709551615\n\n");
 }
 
@@ -50,7 +51,7 @@ TEST(Messages, AreIndependentOfTheStreamsSettings)
     std::ostringstream os;
     os.imbue(std::locale(std::locale::classic(), new CommaPunctuation));
     os << std::hex << std::showbase << std::showpos << std::setfill('*') << std::setw(30);
-    messages::writeLine(os, "n=", 1234567, ';');
+    morvik::messages::writeLine(os, "n=", 1234567, ';');
     EXPECT_EQ(os.str(), "n=1234567;\n");
 }
 
@@ -58,10 +59,10 @@ TEST(Messages, AreWrittenAndFlushedOnceEach)
 {
     CallCounter buffer;
     std::ostream os(&buffer);
-    messages::writePart(os, "part");
+    morvik::messages::writePart(os, "part");
     EXPECT_EQ(buffer.flushes, 0);
     EXPECT_EQ(buffer.writes, 1);
-    messages::writeLine(os, 1, 2, 3);
+    morvik::messages::writeLine(os, 1, 2, 3);
     EXPECT_EQ(buffer.writes, 2);
     EXPECT_EQ(buffer.flushes, 1);
 }
@@ -71,7 +72,7 @@ TEST(Messages, AreWholeAtAnyLength)
     for (const std::size_t length : {1000U, 1022U, 1023U, 1024U, 1025U, 5000U}) {
         const std::string text(length, 'x');
         std::ostringstream os;
-        messages::writeLine(os, "a", text, 1, text, "z");
+        morvik::messages::writeLine(os, "a", text, 1, text, "z");
         EXPECT_EQ(os.str(), std::string("a").append(text).append("1").append(text).append("z\n")) << length;
     }
 }
@@ -83,7 +84,7 @@ TEST(Messages, ThatAreLostThrowNothing)
     } takesNothing;
     std::cerr.rdbuf(&takesNothing);
     std::cerr.exceptions(std::ios::badbit);
-    messages::writeError("lost");
+    morvik::messages::writeError("lost");
     EXPECT_TRUE(std::cerr.bad());
     std::cerr.exceptions(std::ios::goodbit);
     std::cerr.clear();
@@ -92,8 +93,8 @@ TEST(Messages, ThatAreLostThrowNothing)
 TEST(Messages, SendErrorsToTheErrorStreamAndWarningsToTheOutputStream)
 {
     const CapturedStreams streams;
-    messages::writeError("ERROR:x:", 1);
-    messages::writeWarning("WARNING:x:", 2);
+    morvik::messages::writeError("ERROR:x:", 1);
+    morvik::messages::writeWarning("WARNING:x:", 2);
     EXPECT_EQ(streams.err(), "ERROR:x:1\n");
     EXPECT_EQ(streams.out(), "WARNING:x:2\n");
 }

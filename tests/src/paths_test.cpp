@@ -22,7 +22,7 @@
 namespace {
 
 using morvik::blocks::Block;
-using simulation_call::Batch;
+using morvik::simulation_call::Batch;
 using State = veltra_ip_morvik_v1_0_state;
 
 /// Some random blocks, one after the other, as a call hands them over.

@@ -25,7 +25,7 @@ std::vector<std::string> takeTexts(std::ostringstream& stream)
 
 }  // namespace
 
-namespace messages {
+namespace morvik::messages {
 
 std::ostream& output()
 {
@@ -37,7 +37,7 @@ std::ostream& error()
     return errorOfThread;
 }
 
-}  // namespace messages
+}  // namespace morvik::messages
 
 namespace morvik::python {
 

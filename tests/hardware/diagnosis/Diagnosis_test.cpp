@@ -12,7 +12,7 @@
 namespace {
 
 using namespace morvik;
-using namespace morvik::doctor;
+using namespace morvik::diagnosis;
 using morvik::support::Accident;
 using morvik::support::SentFrame;
 

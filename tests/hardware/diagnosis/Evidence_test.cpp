@@ -7,7 +7,7 @@
 
 namespace {
 
-using namespace morvik::doctor;
+using namespace morvik::diagnosis;
 
 Case caseOf(const morvik::support::SentFrame& frame)
 {
