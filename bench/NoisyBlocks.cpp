@@ -10,7 +10,7 @@ namespace morvik::bench {
 
 namespace {
 
-/// A noiseless soft value, in steps, for a received amplitude of 1.25.
+/// A noiseless soft value, in eighths, for a received amplitude of 1.25.
 constexpr int amplitude = 10;
 
 NoisyBlocks makeBlocks(unsigned K, unsigned count, double deviation)
