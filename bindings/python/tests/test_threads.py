@@ -47,21 +47,27 @@ class Watch:
         self._end = time.perf_counter()
 
 
+def is_seen(condition, call):
+    """Whether the condition holds for a watched call: the first or, on a busy machine, a later one."""
+    return any(condition(Watch(call)) for _ in range(20))
+
+
 def test_other_threads_run_while_one_decodes(blocks):
     decoder = morvik.Decoder(threads=1)
-    watch = Watch(lambda: decoder.decode(*blocks, iterations=15))
-    assert watch.ticks > 10
+    assert is_seen(lambda watch: watch.ticks > 10, lambda: decoder.decode(*blocks, iterations=15))
 
 
 def test_other_threads_run_during_a_simulation():
-    watch = Watch(lambda: morvik.error_rate(6144, 0.5, threads=1, max_blocks=1000, block_errors=1000))
-    assert watch.ticks > 10
+    def simulate():
+        morvik.error_rate(6144, 0.5, threads=1, max_blocks=1000, block_errors=1000)
+
+    assert is_seen(lambda watch: watch.ticks > 10, simulate)
 
 
 def test_a_batch_is_spread_over_threads(blocks):
     decoder = morvik.Decoder(threads=5)
-    watch = Watch(lambda: decoder.decode(*blocks, iterations=15))
-    assert watch.most_threads >= 1 + 5  # this one, and the threads of the call
+    every = 1 + 5  # this one, and the threads of the call
+    assert is_seen(lambda watch: watch.most_threads >= every, lambda: decoder.decode(*blocks, iterations=15))
 
 
 @pytest.mark.parametrize("threads", [2, 3, 7, 1024])
