@@ -13,13 +13,13 @@
 #include <string>
 #include <vector>
 
-#include "TDecoder3G.h"
 #include "link/Channel.h"
 #include "link/DefaultScale.h"
 #include "link/GaussianNumber.h"
 #include "link/Random.h"
 #include "link/TurboEncoder.h"
 #include "rules/Tail.h"
+#include "src/TDecoder3G.h"
 
 namespace {
 

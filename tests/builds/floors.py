@@ -1,0 +1,51 @@
+#!/usr/bin/env python3
+"""Each folder includes only what stands below it.
+
+  floors.py ROOT
+"""
+
+import pathlib
+import re
+import sys
+
+# What each folder may include, besides itself and include/. The map in CONTRIBUTING.md is this table in words.
+BELOW = {
+    "rules": "",
+    "base": "",
+    "lanes": "rules",
+    "src": "lanes rules",
+    "link": "rules",
+    "simulation": "base link rules",
+    "report": "base simulation rules",
+    "hardware/testbench": "src rules",
+    "hardware/tables": "base",
+    "hardware/vectors": "base hardware/tables hardware/testbench link rules",
+    "hardware/trace": "base hardware/tables hardware/testbench rules",
+    "hardware/comparison": "base hardware/testbench rules src",
+    "hardware/diagnosis": "base hardware/testbench link rules simulation",
+    "validation": "link rules src",
+}
+
+
+def main():
+    root = pathlib.Path(sys.argv[1])
+    included = 0
+    mistakes = []
+    for folder, below in BELOW.items():
+        allowed = {folder, *below.split()}
+        sources = (path for path in (root / folder).rglob("*") if path.suffix in (".h", ".cpp", ".def", ".in"))
+        for path in sources:
+            for header in re.findall(r'^#include "([^"]+)"', path.read_text(), re.MULTILINE):
+                # A bare name is a neighbour, or a header of include/.
+                place = header.rpartition("/")[0] or folder
+                included += 1
+                if place not in allowed:
+                    mistakes.append(f"{path.relative_to(root)} includes {header}")
+                elif not any((root / at / header.rpartition("/")[2]).exists() for at in (place, "include")):
+                    mistakes.append(f"{path.relative_to(root)} includes {header}, which is in neither {place}/ nor include/")
+    print("\n".join(mistakes) or f"{included} includes in {len(BELOW)} folders lead down")
+    return 1 if mistakes or included == 0 else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
