@@ -74,10 +74,16 @@ stage_abi-renew() {
     done
 }
 
+# What no header declares that users include may change.
 write_abi() {
     scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel
+    local headers=build/abi-headers
+    rm -rf "$headers"
+    mkdir "$headers"
+    cp include/*.h rules/*.h src/DecoderState.h "$headers"
+    sed -n '/^set(MORVIK_CLASS_HEADERS/,/)/s/^ *\([A-Za-z0-9]*\.h\).*/src\/\1/p' cmake/Install.cmake | xargs cp -t "$headers"
     abidw --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
-        --headers-dir include --headers-dir src "$(library_of "$1")" | xz -9 >"$2"
+        --headers-dir "$headers" "$(library_of "$1")" | xz -9 >"$2"
 }
 
 library_of() {
