@@ -112,6 +112,25 @@ void expectEqualColumns(const State& expected, const State& got, unsigned column
     }
 }
 
+/// Changes each number of the decoder's tables in turn.
+void forEachTableEntry(TDecoder3GPU& decoder, const std::function<void(std::uint32_t&)>& use)
+{
+    use(decoder.itsNT);
+    for (auto* segments : {&decoder.itsAlphaSegment, &decoder.itsBetaSegment}) {
+        for (TDecoder3GPU::ABSegment& segment : *segments) {
+            use(segment.from);
+            // A last segment with another end is one of another block size, whose tables are made anew.
+            if (&segment != &decoder.itsAlphaSegment.back()) {
+                use(segment.to);
+            }
+        }
+    }
+    for (std::vector<unsigned>* table : {&decoder.itsInterleaver->itsPi, &decoder.itsInterleaver->itsPiInv}) {
+        use(table->front());
+        use(table->back());
+    }
+}
+
 }  // namespace
 
 TEST(Paths, GiveTheSameByTheSameVerbs)
@@ -173,6 +192,28 @@ TEST(PathChoice, IsForTheLanesWhereNobodyWatchesAndNothingIsChanged)
         change(state);
         EXPECT_EQ(state.path_choice->lanesFor(40), nullptr);
     }
+}
+
+TEST(PathChoice, IsForTheLanesWhereTheTablesAreTheDecodersOwn)
+{
+    constexpr unsigned K = 128;
+    const morvik::blocks::Decoder made(2, 1);
+    State& state = *made.state();
+    ComponentPath components(state);
+    components.take(Blocks(1, K).batch(1), 0, 1);
+    ASSERT_EQ(components.decode(1), 0);
+    auto& decoder = dynamic_cast<TDecoder3GPU&>(*state.decoder);
+    ASSERT_EQ(decoder.itsAlphaSegment.size(), 2U);
+    unsigned entries = 0;
+    forEachTableEntry(decoder, [&](std::uint32_t& entry) {
+        EXPECT_NE(state.path_choice->lanesFor(K), nullptr) << entries;
+        ++entry;
+        EXPECT_EQ(state.path_choice->lanesFor(K), nullptr) << entries;
+        --entry;
+        ++entries;
+    });
+    EXPECT_NE(state.path_choice->lanesFor(K), nullptr);
+    EXPECT_EQ(entries, 1U + 3 + 4 + 4);
 }
 
 TEST(PathChoice, IsForTheLanesWhereTheStandardHasTheSize)
