@@ -1,4 +1,4 @@
-// ChildProcess: another program run to its end, without a shell between.
+// ChildProcess: runs another program to completion, without a shell.
 #include "ChildProcess.h"
 
 #include <spawn.h>
@@ -19,7 +19,7 @@ namespace {
     throw std::system_error(error, std::generic_category());
 }
 
-/// A file in memory. As standard streams, files cannot fill up and stop the program, as pipes do while nobody reads.
+/// A file in memory. Unlike a pipe, it never fills up and blocks the program whose standard stream it is.
 class MemoryFile {
 public:
     explicit MemoryFile(const std::string& content = {}) : itsDescriptor(memfd_create("stream", MFD_CLOEXEC))
@@ -58,7 +58,7 @@ private:
     int itsDescriptor;
 };
 
-/// The descriptors that a program finds as its standard streams.
+/// The descriptors that a program gets as its standard streams.
 class Streams {
 public:
     explicit Streams(const std::array<int, 3>& descriptors)

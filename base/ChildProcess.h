@@ -1,4 +1,4 @@
-// ChildProcess: another program run to its end, without a shell between.
+// ChildProcess: runs another program to completion, without a shell.
 #ifndef MORVIK_BASE_CHILDPROCESS_H
 #define MORVIK_BASE_CHILDPROCESS_H
 
@@ -7,15 +7,15 @@
 
 namespace morvik::base {
 
-/// What a program leaves behind.
+/// The result of a finished program.
 struct Outcome {
     bool succeeded;  // ended with exit status 0
     std::string out;
     std::string err;
 };
 
-/// Runs a program that is looked up in PATH; the input is what it finds on its standard input. Throws
-/// std::system_error when it cannot be started.
+/// Runs a program found through PATH, with `input` on its standard input, and waits for it to end. Throws
+/// std::system_error if it cannot be started.
 Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input);
 
 }  // namespace morvik::base

@@ -1,4 +1,4 @@
-// Csv: comma-separated values, from whatever program they come.
+// Csv: reads comma-separated values of any origin.
 #include "Csv.h"
 
 #include <algorithm>

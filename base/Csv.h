@@ -1,4 +1,4 @@
-// Csv: comma-separated values, from whatever program they come.
+// Csv: reads comma-separated values of any origin.
 #ifndef MORVIK_BASE_CSV_H
 #define MORVIK_BASE_CSV_H
 
@@ -11,31 +11,31 @@
 
 namespace morvik::base {
 
-/// The texts between the commas, at least one, without the blanks around them.
+/// Splits a line at its commas into at least one field, without surrounding blanks.
 std::vector<std::string_view> fieldsOf(std::string_view line);
 
-/// The lines of a text as rows of fields. No field has a comma: quotation marks are characters like others.
+/// Reads lines as rows of fields. Knows no quoting: quotation marks are ordinary characters, and no field has a comma.
 class CsvReader {
 public:
-    /// `lines` outlive the reader.
+    /// `lines` must outlive the reader.
     explicit CsvReader(LineReader& lines) : itsLines(lines) {}
 
     /// Goes to the next line; false at the end.
     bool next();
 
-    /// Takes the line that `lines` have come to by themselves.
+    /// Splits the line that `lines` already stands at.
     void takeLine();
 
-    /// The fields of the row, at least one, without the blanks around them. Valid until the next line.
+    /// The fields of the row, at least one, without surrounding blanks. Valid until the next line.
     const std::vector<std::string_view>& fields() const
     {
         return itsFields;
     }
 
-    /// Whether the row has the fields of this line, as a header has to.
+    /// Whether the row has exactly the fields of `line`; for checking headers.
     bool is(std::string_view line) const;
 
-    /// The first field of the row that is this text.
+    /// The index of the first field that equals `text`.
     std::optional<std::size_t> find(std::string_view text) const;
 
 private:

@@ -1,4 +1,4 @@
-// Descriptor: an open file of the operating system.
+// Descriptor: owns a file descriptor.
 #ifndef MORVIK_BASE_DESCRIPTOR_H
 #define MORVIK_BASE_DESCRIPTOR_H
 
@@ -13,7 +13,7 @@
 
 namespace morvik::base {
 
-/// An open file, closed at the end of its life.
+/// Owns an open file descriptor and closes it.
 class Descriptor {
 public:
     explicit Descriptor(int number) : itsNumber(number) {}
@@ -27,7 +27,7 @@ public:
 
     ~Descriptor()
     {
-        const int reason = errno;  // that a caller is still to tell
+        const int reason = errno;  // the caller may still report it
         close(itsNumber);
         errno = reason;
     }
@@ -56,7 +56,7 @@ public:
 
     bool sync() const
     {
-        return fsync(itsNumber) == 0 || errno == EINVAL;  // that is: a file system without it
+        return fsync(itsNumber) == 0 || errno == EINVAL;  // EINVAL: not supported by the file system
     }
 
     bool allow(mode_t mode) const
@@ -64,14 +64,14 @@ public:
         return fchmod(itsNumber, mode) == 0;
     }
 
-    /// Takes the file for this process, until it is closed or the process ends, however it does; false if another has
-    /// it. Where the file system knows no locks, whoever asks gets it.
+    /// Locks the file for this process until it is closed or the process ends in any way; false if another process
+    /// holds the lock. Always succeeds on file systems without locks.
     bool lock() const
     {
         return flock(itsNumber, LOCK_EX | LOCK_NB) == 0 || errno != EWOULDBLOCK;
     }
 
-    /// Whether the name is this file's.
+    /// Whether `fileName` names this file.
     bool isAt(const std::string& fileName) const
     {
         struct stat own = {};

@@ -1,4 +1,4 @@
-// Error: what a program cannot go on with.
+// Error: the errors that a program reports to its user.
 #include "Error.h"
 
 #include <cerrno>

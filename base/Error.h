@@ -1,4 +1,4 @@
-// Error: what a program cannot go on with.
+// Error: the errors that a program reports to its user.
 #ifndef MORVIK_BASE_ERROR_H
 #define MORVIK_BASE_ERROR_H
 
@@ -7,13 +7,13 @@
 
 namespace morvik::base {
 
-/// Something is wrong with what the user gave or with a file. The text is one line.
+/// An error in the user's input or in accessing a file. The text is one line.
 class Error : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
 };
 
-/// "FILE: cannot be ACTION: " and the operating system's reason for the failure just seen, errno.
+/// "FILE: cannot be ACTION: REASON", with the operating system's reason for errno.
 Error fileError(const std::string& file, const std::string& action);
 
 }  // namespace morvik::base

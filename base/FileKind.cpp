@@ -1,4 +1,4 @@
-// FileKind: files that are given for a text and are none, known by their first bytes.
+// FileKind: recognises files that are not text by their first bytes.
 #include "FileKind.h"
 
 #include <array>
@@ -14,7 +14,7 @@ struct Kind {
     const char* what;
 };
 
-/// FST opens with a block of type 0 and 329 bytes, or is compressed as a whole: type 254.
+/// FST begins with a block of type 0 and 329 bytes or, compressed as a whole, with one of type 254.
 constexpr std::array<Kind, 10> kinds = {{
     {"\x1F\x8B"sv, "is compressed by gzip; 'gunzip FILE' unpacks it"},
     {"\xFD\x37zXZ\0"sv, "is compressed by xz; 'unxz FILE' unpacks it"},

@@ -1,4 +1,4 @@
-// InputFile: files that are read.
+// InputFile: opens files for reading.
 #include "InputFile.h"
 
 #include <iostream>

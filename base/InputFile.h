@@ -1,4 +1,4 @@
-// InputFile: files that are read.
+// InputFile: opens files for reading.
 #ifndef MORVIK_BASE_INPUTFILE_H
 #define MORVIK_BASE_INPUTFILE_H
 
@@ -16,7 +16,7 @@ std::ifstream openFile(const std::string& name);
 /// A file open for reading, or standard input.
 class InputFile {
 public:
-    /// Opens the file, for standardStream the standard input. Throws Error.
+    /// Opens the file, or standard input for standardStream. Throws Error.
     explicit InputFile(const std::string& name);
 
     std::istream& stream();

@@ -1,4 +1,4 @@
-// Json: the one reader of JSON, which takes no text on trust, and what messages and files need beside it.
+// Json: parses untrusted JSON; helpers for JSON in messages and files.
 #include "Json.h"
 
 #include <algorithm>
@@ -14,7 +14,7 @@ namespace morvik::base {
 
 namespace {
 
-/// Goes over a text and notes how far the parser has come.
+/// Iterates over a text and records how far the parser has read.
 class Cursor {
 public:
     using iterator_category = std::input_iterator_tag;
@@ -78,7 +78,7 @@ public:
         try {
             return Json::parse(Cursor(itsText.data(), itsSeen), Cursor(end, itsSeen), watch);
         } catch (const Json::parse_error& error) {
-            // Bytes are counted from 1; the end of the text is one behind the last.
+            // The parser counts bytes from 1; the end of the text is one past the last.
             const std::size_t place = std::max(error.byte, std::size_t{1}) - 1;
             fail(place, "no JSON, character " + std::to_string(character(place)) + " is not expected there");
         } catch (const Json::exception&) {
@@ -115,14 +115,14 @@ private:
         itsOpen.emplace_back();
     }
 
-    /// The place of the character that was read last.
+    /// The offset of the last character read.
     std::size_t behind() const
     {
         const auto read = static_cast<std::size_t>(itsSeen - itsText.data());
         return std::max(read, std::size_t{1}) - 1;
     }
 
-    /// The number of a character in its line, from 1.
+    /// The column of a character, from 1.
     std::size_t character(std::size_t place) const
     {
         const std::size_t before = place == 0 ? std::string::npos : itsText.rfind('\n', place - 1);
@@ -140,7 +140,7 @@ private:
     const JsonLimits& itsLimits;
     const char* itsSeen = itsText.data();
     std::size_t itsValues = 0;
-    std::vector<std::set<std::string>> itsOpen;  // the names so far, of each object and list that has not ended
+    std::vector<std::set<std::string>> itsOpen;  // names so far in each open object and list
 };
 
 }  // namespace

@@ -1,4 +1,4 @@
-// Json: the one reader of JSON, which takes no text on trust, and what messages and files need beside it.
+// Json: parses untrusted JSON; helpers for JSON in messages and files.
 #ifndef MORVIK_BASE_JSON_H
 #define MORVIK_BASE_JSON_H
 
@@ -11,29 +11,29 @@ namespace morvik::base {
 
 using Json = nlohmann::json;
 
-/// What a text may have at most: far more than any file that is written here, and too little to exhaust a machine.
+/// Limits of a text: far above any file that is written here, too low to exhaust a machine.
 struct JsonLimits {
     std::size_t bytes = std::size_t{1} << 28;
     std::size_t values = std::size_t{1} << 25;
-    std::size_t levels = 32;  // of lists and objects within each other
+    std::size_t levels = 32;  // of nested lists and objects
 };
 
-/// Reads a text whose limits are kept and whose objects name no member twice. Throws Error "FILE:LINE: ...".
+/// Parses a text. Refuses one beyond the limits or with duplicate names in an object. Throws Error "FILE:LINE: ...".
 Json parseJson(const std::string& text, const std::string& fileName, const JsonLimits& limits = {});
 
-/// A value as messages show it: short, on one line.
+/// A value for messages: short, on one line.
 std::string shownValue(const Json& value);
 
-/// The text with U+FFFD for bytes that are no UTF-8, which JSON cannot hold.
+/// The text with U+FFFD for each invalid byte of UTF-8, which JSON cannot hold.
 std::string asUtf8(const std::string& text);
 
-/// The text as a string of JSON, quotation marks included.
+/// The text as a JSON string, quotation marks included.
 std::string jsonString(const std::string& text);
 
-/// The members of an object. Whatever is wrong with them is thrown as Error: "PLACE: ...".
+/// Typed access to the members of an object. Throws Error "PLACE: ..." if they are missing or wrong.
 class JsonMembers {
 public:
-    /// Throws unless the value is an object. The value outlives the members.
+    /// Throws unless the value is an object. The value must outlive the members.
     JsonMembers(const Json& value, std::string place);
 
     bool has(const std::string& name) const;

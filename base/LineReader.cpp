@@ -1,4 +1,4 @@
-// LineReader: a text read line by line, whatever it is and however long, with the places for messages.
+// LineReader: reads any text line by line in bounded memory, with positions for messages.
 #include "LineReader.h"
 
 #include <algorithm>
@@ -74,10 +74,10 @@ void LineReader::failAt(std::size_t line, const std::string& what) const
     throw Error(placeOf(itsName, line) + ": " + what);
 }
 
-/// Reads a line into the buffer, of a long one as much as tells that it is too long. Returns its length.
+/// Reads a line into the buffer and returns its length. Reads only as much of an overlong line as shows that it is.
 std::size_t LineReader::readLine()
 {
-    const std::size_t most = byteOrderMark.size() + itsLongest + 1 + 1 + 1;  // \r, one too many, and a null at the end
+    const std::size_t most = byteOrderMark.size() + itsLongest + 1 + 1 + 1;  // \r, one excess character, final null
     for (std::size_t length = 0;;) {
         itsInput.getline(itsBuffer.data() + length, static_cast<std::streamsize>(itsBuffer.size() - length));
         length += static_cast<std::size_t>(itsInput.gcount());

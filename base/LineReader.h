@@ -1,4 +1,4 @@
-// LineReader: a text read line by line, whatever it is and however long, with the places for messages.
+// LineReader: reads any text line by line in bounded memory, with positions for messages.
 #ifndef MORVIK_BASE_LINEREADER_H
 #define MORVIK_BASE_LINEREADER_H
 
@@ -10,23 +10,22 @@
 
 namespace morvik::base {
 
-/// Reads lines that end in \n, \r\n or the end of the text. Memory does not grow with the input. A byte order mark
-/// before the first line, which spreadsheets write, is no part of it. What is wrong is thrown as an Error that opens
-/// with the place, NAME:LINE.
+/// Reads lines that end in \n, \r\n or the end of the text. Memory does not grow with the input. Skips a byte order
+/// mark before the first line, which spreadsheets write. Throws Error, opening with the place NAME:LINE.
 class LineReader {
 public:
-    /// Longest lines, in characters: more than a row of numbers or a line of bits needs, and more than a value of any
-    /// width does.
+    /// Limits on the length of lines, in characters: shortLines is ample for a row of numbers or a line of bits,
+    /// longLines for a value of any width.
     static constexpr std::size_t shortLines = 8192;
     static constexpr std::size_t longLines = std::size_t{1} << 20;
 
-    /// Most blank lines at the end.
+    /// Most blank lines allowed at the end.
     static constexpr std::size_t mostBlank = 10000;
 
-    /// `input` outlives the reader; `name` is what messages call it. No line may have more than `longest` characters.
+    /// `input` must outlive the reader; messages call it `name`. Lines have at most `longest` characters.
     LineReader(std::istream& input, std::string name, std::size_t longest);
 
-    /// Goes to the next line; false at the end. Throws when the input cannot be read, is no text, or the line is too
+    /// Reads the next line; false at the end. Throws if the input cannot be read or is not text, or the line is too
     /// long.
     bool next();
 
@@ -47,10 +46,10 @@ public:
         return itsName;
     }
 
-    /// NAME:LINE, of a text without lines that of the first.
+    /// NAME:LINE; line 1 if the text has no lines.
     std::string place() const;
 
-    /// Throws when blank lines, of which the first has the given number, go on for ever.
+    /// Throws if the blank lines that begin at line `first` exceed mostBlank.
     void expectAnEnd(std::size_t first) const;
 
     /// Throws an Error about this line.

@@ -1,4 +1,4 @@
-// Numbers: numbers from text and back. Locales have no say in them.
+// Numbers: converts numbers to and from text, whatever the locale.
 #ifndef MORVIK_BASE_NUMBERS_H
 #define MORVIK_BASE_NUMBERS_H
 
@@ -13,8 +13,8 @@
 
 namespace morvik::base {
 
-/// The number that the whole text writes, of an integer in decimal or to the base that is given; nothing if there is
-/// anything else, or the number does not fit.
+/// Parses the whole text as a number, integers in decimal or in the given base. Nothing if it has any other character
+/// or the number is out of range.
 template <class Number, class... Base>
 std::optional<Number> parseNumber(std::string_view text, Base... base)
 {
@@ -24,7 +24,7 @@ std::optional<Number> parseNumber(std::string_view text, Base... base)
     return result.ec == std::errc() && result.ptr == end ? std::optional<Number>(value) : std::nullopt;
 }
 
-/// The number as text, the shortest that gives a double again unless a form is asked for.
+/// The number as text; a double in the shortest form that parses to the same value unless another form is given.
 template <class Number, class... Form>
 std::string numberText(Number value, Form... form)
 {
@@ -33,7 +33,7 @@ std::string numberText(Number value, Form... form)
     return {text.data(), result.ptr};
 }
 
-/// Takes the text from the beginning of another; false, and nothing taken, when that begins otherwise.
+/// Removes the prefix `text` from `rest`; false, with `rest` unchanged, if it begins otherwise.
 inline bool take(std::string_view& rest, std::string_view text)
 {
     if (rest.substr(0, text.size()) != text) {
@@ -43,7 +43,7 @@ inline bool take(std::string_view& rest, std::string_view text)
     return true;
 }
 
-/// Takes a decimal integer, if the text begins with one.
+/// Parses a decimal integer at the beginning of the text and removes it, if there is one.
 inline std::optional<std::int64_t> takeInteger(std::string_view& rest)
 {
     std::int64_t value = 0;

@@ -1,4 +1,4 @@
-// OutputFile: the one way in which files are written.
+// OutputFile: writes files.
 #include "OutputFile.h"
 
 #include <fcntl.h>
@@ -21,20 +21,20 @@ namespace morvik::base {
 
 namespace {
 
-/// As many links behind each other as Linux follows.
+/// Longest chain of symbolic links, as in Linux.
 constexpr int mostLinks = 40;
 
 constexpr std::size_t bufferSize = 65536;
 
 constexpr mode_t permissions = S_IRWXU | S_IRWXG | S_IRWXO;
 
-/// What a name leads to over links: a path, whether there is something or not, or an open descriptor of this process.
+/// What a name resolves to through links: a path, existing or not, or an open descriptor of this process.
 struct Place {
     std::string path;
     std::optional<int> descriptor;
 };
 
-/// The descriptor that has such a name: a link of which nobody can tell where it leads.
+/// The descriptor that such a path names: its link may not lead to any path.
 std::optional<int> descriptorNamed(std::string_view path)
 {
     for (const std::string_view folder : {"/dev/fd/", "/proc/self/fd/"}) {
@@ -52,7 +52,7 @@ Place placeOf(const std::string& name)
     }
     std::filesystem::path path = name;
     for (int links = 0; links <= mostLinks; ++links) {
-        std::error_code none;  // of a link
+        std::error_code none;  // set if this is no link
         const auto descriptor = descriptorNamed(path.string());
         const std::filesystem::path next = descriptor ? path : std::filesystem::read_symlink(path, none);
         if (descriptor || none) {
@@ -70,14 +70,14 @@ std::string folderOf(const std::string& place)
     return folder.empty() ? "." : folder.string();
 }
 
-/// A name in the folder that nobody else uses or would give.
+/// A name in the folder that nobody else is likely to use.
 std::string temporaryName(const std::string& folder)
 {
     static std::atomic<unsigned> count{0};
     return folder + "/.morvik-" + std::to_string(getpid()) + '-' + std::to_string(count++);
 }
 
-/// The name by which the system knows an open file of this process.
+/// The path of an open file of this process.
 std::string nameOf(const Descriptor& file)
 {
     return "/proc/self/fd/" + std::to_string(file.number());
@@ -90,7 +90,7 @@ OutputFile::OutputFile(const std::string& name) : itsName(name == standardStream
     const Place place = placeOf(name);
     struct stat old = {};
     if (place.descriptor) {
-        std::cout.flush();  // what has been printed stands before this
+        std::cout.flush();  // earlier output comes first
         itsFile = Descriptor(fcntl(*place.descriptor, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
         itsIsStandardOutput = place.descriptor == STDOUT_FILENO;
     } else if (stat(place.path.c_str(), &old) != 0) {
@@ -103,7 +103,7 @@ OutputFile::OutputFile(const std::string& name) : itsName(name == standardStream
     } else if (access(place.path.c_str(), W_OK) == 0) {
         openNew(place.path, old.st_mode & permissions);
         if (itsFile.isOpen()) {
-            itsFile.allow(old.st_mode & permissions);  // not every file system can; it has no more of them in any case
+            itsFile.allow(old.st_mode & permissions);  // may fail on some file systems; open() grants no more
         }
     }
     if (!itsFile.isOpen()) {
@@ -189,7 +189,7 @@ Descriptor OutputFile::commit()
     return std::move(itsFile);
 }
 
-/// Where the file system and the system allow, the new file has no name, and goes with the process however that ends.
+/// Creates the file unnamed where supported, so that it vanishes with the process; elsewhere under a temporary name.
 void OutputFile::openNew(const std::string& place, mode_t mode)
 {
     itsPlace = place;
@@ -204,7 +204,7 @@ void OutputFile::openNew(const std::string& place, mode_t mode)
     } while (!itsFile.isOpen() && errno == EEXIST);
 }
 
-/// A file without a name cannot take the place of another at once.
+/// Gives an unnamed file a temporary name: only a named one can replace another atomically.
 bool OutputFile::nameNew()
 {
     if (!itsTemporary.empty()) {

@@ -1,4 +1,4 @@
-// OutputFile: the one way in which files are written.
+// OutputFile: writes files.
 #ifndef MORVIK_BASE_OUTPUTFILE_H
 #define MORVIK_BASE_OUTPUTFILE_H
 
@@ -10,45 +10,45 @@
 
 namespace morvik::base {
 
-/// What names standard input and output where a file may be named.
+/// Stands for standard input or output in place of a file name.
 constexpr char standardStream[] = "-";
 
-/// A file that is written piece by piece. Whenever the process stops, there is the old file or the new one as a whole:
-/// the new one has no name before it is complete, and takes the place of the other then. A symbolic link is followed;
-/// permissions stay, but for those that change who a program runs as.
+/// Writes a file piece by piece and replaces it atomically: whenever the process stops, either the old file or the
+/// complete new one is there. The new one gets its name only when complete. Follows symbolic links; keeps permissions,
+/// except those that change the user or group that a program runs as.
 ///
-/// What is no regular file, as a device, a named pipe, or a descriptor by its name (/dev/stdout), cannot be replaced:
-/// it is written to as it is, like standard output. Whatever goes wrong is thrown as an Error that opens with the name.
+/// Devices, named pipes and descriptors by name (/dev/stdout) cannot be replaced: they are written directly, like
+/// standard output. Throws Error, opening with the name.
 class OutputFile {
 public:
-    /// Opens the file, for standardStream the standard output.
+    /// Opens the file, or standard output for standardStream.
     explicit OutputFile(const std::string& name);
     OutputFile(OutputFile&&) noexcept = default;
     OutputFile& operator=(OutputFile&&) = delete;
     ~OutputFile();
 
-    /// Whether it is the standard output, under whatever name.
+    /// Whether this is standard output, under whatever name.
     bool isStandardOutput() const;
 
-    /// Whether there will be a new file when all is written, and not before.
+    /// Whether commit() replaces the file; until then, nobody sees the new one.
     bool isReplaced() const;
 
     void write(std::string_view text);
 
-    /// Puts the text in the place of the first bytes, which only a file that is replaced has.
+    /// Overwrites the first bytes; only for a file that is replaced.
     void overwriteStart(std::string_view text);
 
-    /// Hands over what has been written so far, if somebody may be reading it.
+    /// Writes out the buffer, unless the file is replaced and has no reader yet.
     void flush();
 
-    /// Makes this process the only one that can lock the new file.
+    /// Locks the new file for this process.
     void lock() const;
 
-    /// Makes commit() wait for the disk: there is the old file or the new one even when the machine stops. For what is
-    /// not easily made again.
+    /// Makes commit() sync to disk, so that the old or the new file survives even a crash of the machine. For content
+    /// that is expensive to recreate.
     void secure();
 
-    /// The file is complete. Returns it, still open, for whoever keeps it locked.
+    /// Completes the file. Returns it, still open, so that the caller can keep it locked.
     Descriptor commit();
 
 private:
@@ -58,25 +58,25 @@ private:
     [[noreturn]] void fail() const;
 
     std::string itsName;
-    std::string itsPlace;      // where the new file is to be; empty if none is made
-    std::string itsTemporary;  // the name that it has until then, if it needs one
+    std::string itsPlace;      // the path to replace; empty if written directly
+    std::string itsTemporary;  // the new file's name until then, if any
     Descriptor itsFile;
-    std::string itsText;  // that is still to be written
+    std::string itsText;  // not yet written
     bool itsIsStandardOutput = false;
     bool itsIsSecured = false;
 };
 
-/// Writes a file as a whole, secured.
+/// Writes a whole file, secured.
 void writeFile(const std::string& name, std::string_view content);
 
-/// Throws Error unless a regular file of this name can be expected to be written.
+/// Throws Error unless a regular file of this name can be written.
 void checkWritable(const std::string& name);
 
-/// Throws Error if what is written to a file, which has its content's name in the plural, would go into one of the
-/// inputs. Names are as OutputFile takes them; an empty one is no file.
+/// Throws Error if the output file `name` is also one of the inputs. `content` names what it would hold, in the plural.
+/// Names are those of OutputFile; an empty one is no file.
 void expectOwnFile(const std::string& name, const std::vector<std::string>& inputs, const std::string& content);
 
-/// Whether what is written to one file would take the other's place. Throws Error if a link leads nowhere.
+/// Whether writing one file would replace the other. Throws Error if a link leads nowhere.
 bool isSamePlace(const std::string& a, const std::string& b);
 
 }  // namespace morvik::base

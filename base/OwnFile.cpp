@@ -1,4 +1,4 @@
-// OwnFile: a file that one process at a time has for itself.
+// OwnFile: a file that one process at a time owns.
 #include "OwnFile.h"
 
 #include <fcntl.h>
@@ -13,7 +13,7 @@ namespace morvik::base {
 
 namespace {
 
-/// Links included, wherever they lead.
+/// Refuses links, too, wherever they lead.
 void refuseOtherThanFile(const std::string& fileName)
 {
     struct stat found = {};
@@ -27,8 +27,8 @@ void refuseOtherThanFile(const std::string& fileName)
 OwnFile::OwnFile(std::string fileName) : itsName(std::move(fileName)), itsFile(-1)
 {
     refuseOtherThanFile(itsName);
-    // Between the two steps the file may have gone, or another may have taken its place, with the lock on that one.
-    constexpr int patience = 100;  // with a file system that tells files apart by nothing steady
+    // Between open() and the lock, the file may have been removed, or replaced by one that another process has locked.
+    constexpr int patience = 100;  // for file systems without stable inode numbers
     for (int i = 0; i < patience && !itsIsTaken && !itsFile.isAt(itsName); ++i) {
         itsFile = Descriptor(open(itsName.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0666));
         itsIsTaken = itsFile.isOpen() && !itsFile.lock();
@@ -56,7 +56,7 @@ void OwnFile::write(const std::string& content)
 {
     refuseOtherThanFile(itsName);
     OutputFile file(itsName);
-    file.lock();  // before it has the name
+    file.lock();  // before others see it
     file.secure();
     file.write(content);
     itsFile = file.commit();

@@ -1,4 +1,4 @@
-// OwnFile: a file that one process at a time has for itself.
+// OwnFile: a file that one process at a time owns.
 #ifndef MORVIK_BASE_OWNFILE_H
 #define MORVIK_BASE_OWNFILE_H
 
@@ -8,25 +8,25 @@
 
 namespace morvik::base {
 
-/// Has a file, from before it is there until it is removed or the process ends. The file itself is what is locked, so
-/// that there is no other that a killed process could leave. A new one is empty until it is written, and goes with the
-/// object if it never is.
+/// Owns a file exclusively, from before it exists until it is removed or the process ends. The lock is on the file
+/// itself: a killed process leaves no lock file behind. A new file is empty until written; the destructor removes it if
+/// it never was.
 class OwnFile {
 public:
-    /// If another process has the file, isTaken() tells. If it cannot be opened, writing will tell. Throws Error where
-    /// there is something else than a regular file: a link would lead to somebody else's.
+    /// If another process owns the file, isTaken() is true. If it cannot be opened, write() fails. Throws Error if the
+    /// name is of anything but a regular file: a link could lead to somebody else's.
     explicit OwnFile(std::string fileName);
     OwnFile(const OwnFile&) = delete;
     OwnFile& operator=(const OwnFile&) = delete;
     ~OwnFile();
 
-    /// Whether it is another process's.
+    /// Whether another process owns the file.
     bool isTaken() const;
 
-    /// Whether there was no such file, or nothing in it.
+    /// Whether the file did not exist or is empty.
     bool isNew() const;
 
-    /// Replaces the content, atomically. Throws Error.
+    /// Replaces the content atomically. Throws Error.
     void write(const std::string& content);
 
     /// Throws Error.

@@ -1,4 +1,4 @@
-// Printable: texts of unknown content, as a terminal may get them.
+// Printable: makes text of unknown content safe for a terminal.
 #include "Printable.h"
 
 namespace morvik::base {
@@ -10,7 +10,7 @@ bool isContinuation(char c)
     return (static_cast<unsigned char>(c) & 0xc0U) == 0x80U;
 }
 
-/// Whether the character of so many bytes that the text begins with is in C0 or C1, or is DEL.
+/// Whether the first character, `length` bytes long, is a C0 or C1 control or DEL.
 bool isControl(std::string_view text, std::size_t length)
 {
     const bool isC1 = length == 2 && text[0] == '\xc2' && static_cast<unsigned char>(text[1]) < 0xa0U;
@@ -28,7 +28,7 @@ std::string inHexadecimal(std::string_view bytes)
     return text;
 }
 
-/// Takes the first character, or a byte that is part of none, off the text. Returns it as it is shown.
+/// Removes the first character, or an invalid byte, from the text. Returns it in visible form.
 std::string takeFirst(std::string_view& text, bool keepsLines)
 {
     const std::size_t length = lengthOfFirst(text);
@@ -67,7 +67,7 @@ std::size_t lengthOfFirst(std::string_view text)
             return 0;
         }
     }
-    // Forms longer than need be, surrogates, what is beyond the last character, and two that XML does not have.
+    // Overlong forms, surrogates, anything above U+10FFFF, and U+FFFE and U+FFFF, which XML excludes.
     const unsigned second = byteAt(1);
     const bool isNone = (first == 0xe0 && second < 0xa0) || (first == 0xed && second >= 0xa0) ||
                         (first == 0xf0 && second < 0x90) || (first == 0xf4 && second >= 0x90) ||

@@ -1,4 +1,4 @@
-// Printable: texts of unknown content, as a terminal may get them.
+// Printable: makes text of unknown content safe for a terminal.
 #ifndef MORVIK_BASE_PRINTABLE_H
 #define MORVIK_BASE_PRINTABLE_H
 
@@ -8,17 +8,17 @@
 
 namespace morvik::base {
 
-/// The length of the character of UTF-8 that the text, which is not empty, begins with; 0 where there is none.
+/// The length in bytes of the first UTF-8 character of a non-empty text; 0 if it is invalid.
 std::size_t lengthOfFirst(std::string_view text);
 
-/// The text with each byte that is part of a control character, or of none, written as \x1b: such characters may move
-/// the cursor, rename the window, or hide what was printed before.
+/// The text with each byte of a control character or of invalid UTF-8 escaped as \x1b: control characters may move the
+/// cursor, rename the window, or hide what was printed before.
 std::string visible(std::string_view text);
 
-/// The same of a text of several lines, whose ends stay.
+/// The same for text of several lines, keeping line ends.
 std::string visibleLines(std::string_view text);
 
-/// The visible text, of one that has more than so many bytes the start. No character and no \x1b is cut in two.
+/// The visible text; if longer than `longest` bytes, its start and "...". Never splits a character or an escape.
 std::string shortened(std::string_view text, std::size_t longest);
 
 }  // namespace morvik::base

@@ -1,4 +1,4 @@
-// Shown: text of unknown content in messages.
+// Shown: quotes text of unknown content in messages.
 #ifndef MORVIK_BASE_SHOWN_H
 #define MORVIK_BASE_SHOWN_H
 

@@ -1,4 +1,4 @@
-// StandardStreams: the descriptors 0, 1 and 2, which a program may be started without.
+// StandardStreams: the descriptors 0, 1 and 2, which may be closed when a program starts.
 #include "StandardStreams.h"
 
 #include <fcntl.h>
@@ -17,7 +17,7 @@ void prepareStandardStreams()
         if (fcntl(stream, F_GETFD) >= 0 || errno != EBADF) {
             continue;
         }
-        // The lowest free number is this one. Opened the wrong way round, it fails as a closed stream does.
+        // open() returns the lowest free number, this one. Using it in the other direction fails as on a closed stream.
         if (open("/dev/null", stream == STDIN_FILENO ? O_WRONLY : O_RDONLY) != stream) {
             std::abort();
         }

@@ -1,4 +1,4 @@
-// Text: what many readers and messages do with a text.
+// Text: text helpers for readers and messages.
 #ifndef MORVIK_BASE_TEXT_H
 #define MORVIK_BASE_TEXT_H
 
@@ -9,7 +9,7 @@
 
 namespace morvik::base {
 
-/// What some programs write before a text in UTF-8.
+/// Some programs write it at the beginning of UTF-8 text.
 constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
 
 inline std::string_view withoutMark(std::string_view text)
@@ -17,7 +17,7 @@ inline std::string_view withoutMark(std::string_view text)
     return text.substr(0, byteOrderMark.size()) == byteOrderMark ? text.substr(byteOrderMark.size()) : text;
 }
 
-/// The text without the blanks around it.
+/// The text without leading and trailing blanks.
 inline std::string_view trimmed(std::string_view text)
 {
     constexpr std::string_view blanks = " \t\r";

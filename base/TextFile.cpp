@@ -1,4 +1,4 @@
-// TextFile: reads a file as a whole.
+// TextFile: reads whole files.
 #include "TextFile.h"
 
 #include <array>
@@ -47,7 +47,7 @@ std::string readText(std::istream& file, const std::string& name, std::size_t la
 
 void expectRegularFile(const std::string& fileName)
 {
-    std::error_code none;  // if there is nothing
+    std::error_code none;  // set if there is no such file
     if (const auto found = std::filesystem::status(fileName, none);
         std::filesystem::exists(found) && !std::filesystem::is_regular_file(found)) {
         throw Error(fileName + ": is no regular file");

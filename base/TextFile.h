@@ -1,4 +1,4 @@
-// TextFile: reads a file as a whole.
+// TextFile: reads whole files.
 #ifndef MORVIK_BASE_TEXTFILE_H
 #define MORVIK_BASE_TEXTFILE_H
 
@@ -8,17 +8,17 @@
 
 namespace morvik::base {
 
-/// As much as can be read: more than any file of results has.
+/// The most bytes that are read: more than any results file has.
 constexpr std::size_t largestText = std::size_t{1} << 28;
 
-/// The content of a file of text, without a byte order mark. Throws Error, also when it is no text or too large.
+/// The content of a text file, without a byte order mark. Throws Error, also if it is not text or too large.
 std::string readText(const std::string& fileName);
 
-/// Throws Error if there is something else than a regular file, to which a link may lead: a device or a pipe may have
+/// Throws Error if the name, or what it links to, is something other than a regular file: a device or a pipe may have
 /// no end.
 void expectRegularFile(const std::string& fileName);
 
-/// What readText(fileName) gives of an open file, which messages call `name`, of at most so many bytes.
+/// Like readText(fileName), for an open file that messages call `name`, of at most `largest` bytes.
 std::string readText(std::istream& file, const std::string& name, std::size_t largest);
 
 }  // namespace morvik::base

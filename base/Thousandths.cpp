@@ -1,4 +1,4 @@
-// Thousandths: decimal numbers with three places, as integers, so that no result depends on how a decimal was rounded.
+// Thousandths: decimal numbers with three places, as integers, so that no result depends on rounding.
 #include "Thousandths.h"
 
 #include <algorithm>
