@@ -30,7 +30,7 @@ namespace morvik {
 
 namespace {
 
-/// Watches a run in silence.
+/// Ignores all progress.
 class NoTable : public simulation::Progress {
 public:
     void isAt(const simulation::PointResult&) override {}
@@ -63,7 +63,7 @@ bool hasInstructionSet(const std::string& name)
     }
 }
 
-/// Throws Error if the decoder knows no such instruction set, or this machine does not have it.
+/// Throws Error if the decoder does not know the instruction set or this machine lacks it.
 void checkInstructionSet(const std::string& name)
 {
     if (name.empty() || hasInstructionSet(name)) {
@@ -114,7 +114,7 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
     return 128 + Interruption::signal();
 }
 
-/// The files are named after the output, but never overwrite it.
+/// Names the files after the output, but never overwrites it.
 int replayFrame(const BerOptions& options, const simulation::Plan& plan, const ReplayedFrame& replayed)
 {
     if (replayed.point >= plan.points.size()) {

@@ -12,17 +12,17 @@
 
 namespace morvik {
 
-/// What the programs that have the subcommand do differently.
+/// How the programs with this subcommand differ.
 struct BerMeans {
-    std::string command;  // how messages begin
+    std::string command;  // the prefix of messages
 
-    /// Makes whoever simulates the frames of a run. The plan outlives them.
+    /// Creates the workers that simulate the frames of a run. The plan outlives them.
     std::function<std::unique_ptr<simulation::Workers>(const BerOptions& options, const simulation::Plan& plan)>
         makeWorkers;
     bool hasTerminal = false;  // whether standard output may be the user's terminal
 };
 
-/// Adds `ber` to the command line, for runs in threads of this process.
+/// Adds `ber` to the command line, simulating in threads of this process.
 Command addBer(CLI::App& app);
 
 /// Adds `ber` to the command line.

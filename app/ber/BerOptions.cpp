@@ -71,7 +71,7 @@ void appendIterations(const std::string& text, std::vector<unsigned>& values)
     values.push_back(*iterations);
 }
 
-/// What messages say --ebn0 takes beside numbers.
+/// What --ebn0 takes besides numbers, for messages.
 constexpr char orRange[] = ", and START:STEP:STOP";
 
 void appendEbn0(const std::string& text, std::vector<int>& values)
@@ -100,7 +100,7 @@ void appendEbn0(const std::string& text, std::vector<int>& values)
 
 // ---- Single values
 
-/// Reads a count of at least 1.
+/// Parses a count of at least 1.
 std::function<void(const std::string&)> countInto(const std::string& option, std::optional<std::uint64_t>& count)
 {
     return [option, &count](const std::string& text) {
@@ -111,7 +111,7 @@ std::function<void(const std::string&)> countInto(const std::string& option, std
     };
 }
 
-/// Reads 90, 90s, 1.5m or 2h.
+/// Parses 90, 90s, 1.5m or 2h.
 double parseSeconds(const std::string& option, const std::string& text)
 {
     double unit = 1;
@@ -308,7 +308,7 @@ std::string listed(const Values& values, Text textOf)
     return list;
 }
 
-/// A list of ascending values, three and more with equal steps as a range.
+/// Lists ascending values; three or more with equal steps become a range.
 std::string rangesText(const std::vector<int>& values)
 {
     std::string list;
@@ -326,7 +326,7 @@ std::string rangesText(const std::vector<int>& values)
     return list;
 }
 
-/// Holds whatever the results follow from, and nothing else.
+/// Holds the options that determine the results, and no others.
 std::string commandOf(const BerOptions& options, const simulation::StopRules& rules)
 {
     const simulation::Sweep& sweep = options.sweep;

@@ -19,7 +19,7 @@ struct ReplayedFrame {
     std::uint64_t frame = 0;
 };
 
-/// What was asked for; nothing stands for a default that depends on other options.
+/// The options given; empty where the default depends on other options.
 struct BerOptions {
     simulation::Sweep sweep;
     bool eachIteration = false;
@@ -42,10 +42,10 @@ struct BerOptions {
     std::optional<ReplayedFrame> replay;
 };
 
-/// Adds the options, which fill in `options`.
+/// Adds the options, which set `options`.
 void addBerOptions(CLI::App& command, BerOptions& options);
 
-/// The plan that the options ask for, with all defaults.
+/// The plan for the options, with all defaults.
 simulation::Plan planOf(const BerOptions& options);
 
 }  // namespace morvik

@@ -1,4 +1,4 @@
-// Interruption: signals that ask the process to end, taken as a wish that is looked at now and then.
+// Interruption: records signals that ask the process to end, for polling.
 #include "Interruption.h"
 
 #include <csignal>
@@ -16,7 +16,7 @@ extern "C" void note(int signal)
     arrived = signal;
 }
 
-/// Puts the handler in the place of another, for as many signals as have that one now.
+/// Replaces the handler of those signals whose handler is `present`.
 void replaceHandler(void (*present)(int), void (*next)(int), int flags)
 {
     for (const int signal : signals) {

@@ -1,11 +1,11 @@
-// Interruption: signals that ask the process to end, taken as a wish that is looked at now and then.
+// Interruption: records signals that ask the process to end, for polling.
 #ifndef MORVIK_APP_BER_INTERRUPTION_H
 #define MORVIK_APP_BER_INTERRUPTION_H
 
 namespace morvik {
 
-/// Notes SIGINT, SIGTERM and SIGHUP for as long as it lives; one object at a time. A second signal of a kind ends the
-/// process at once. Signals that the process ignores are left so.
+/// Records SIGINT, SIGTERM and SIGHUP during its lifetime; one object at a time. A second signal of the same kind ends
+/// the process at once. Signals that the process ignores stay ignored.
 class Interruption {
 public:
     Interruption();
@@ -13,7 +13,7 @@ public:
     Interruption& operator=(const Interruption&) = delete;
     ~Interruption();
 
-    /// The signal that has come, or 0.
+    /// The signal received, or 0.
     static int signal();
 };
 

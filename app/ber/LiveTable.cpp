@@ -1,4 +1,4 @@
-// LiveTable: a run's points as a table that grows, with a line for the running point on terminals.
+// LiveTable: prints a run's points as a growing table, with a progress line on terminals.
 #include "LiveTable.h"
 
 #include <sys/ioctl.h>
@@ -55,7 +55,7 @@ std::string timeText(double seconds)
     return hours + minutes + ':' + twoDigits(whole % 60);
 }
 
-/// The cells of a line, which fit into 79 columns. The iterations have none unless each of them is looked at.
+/// The cells of a line, which fits 79 columns. `iterations` is empty unless each iteration is measured.
 struct Line {
     std::string point;
     std::optional<std::string> iterations;
@@ -150,7 +150,7 @@ void LiveTable::isAt(const PointResult& running)
     Line line = lineOf(resultsOf(itsPlan, {running}).rows.back(), itsPlan.eachIteration);
     line.bounds = timeLeft(itsPlan, running);
     std::string text = line.text();
-    text.resize(std::min(text.size(), *itsWidth - 1));  // a cursor behind the last column would go to the next line
+    text.resize(std::min(text.size(), *itsWidth - 1));  // a cursor past the last column would wrap
     itsHasMovingLine = true;
     write('\r' + text + std::string(eraseToEnd));
 }
@@ -164,7 +164,7 @@ void LiveTable::hasEnded(const PointResult& point)
     }
 }
 
-/// Opens the table of a curve, unless that is the one that is open.
+/// Starts the table of a curve unless it is already open.
 void LiveTable::writeHeading(const Point& point)
 {
     if (itsHeading && onSameCurve(*itsHeading, point)) {

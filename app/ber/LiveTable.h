@@ -1,4 +1,4 @@
-// LiveTable: a run's points as a table that grows, with a line for the running point on terminals.
+// LiveTable: prints a run's points as a growing table, with a progress line on terminals.
 #ifndef MORVIK_APP_BER_LIVETABLE_H
 #define MORVIK_APP_BER_LIVETABLE_H
 
@@ -13,14 +13,14 @@
 
 namespace morvik {
 
-/// The columns of the terminal that standard output goes to; nothing if it goes elsewhere.
+/// The width in columns of the terminal on standard output; nothing if that is no terminal.
 std::optional<std::size_t> terminalWidth();
 
-/// Writes a heading for each curve and a row for each ended point; with a width, also a moving line that fits into it.
-/// Throws base::Error when the table cannot be written.
+/// Prints a heading for each curve and a row for each finished point; given a width, also a progress line that fits it.
+/// Throws base::Error if the table cannot be written.
 class LiveTable : public simulation::Progress {
 public:
-    /// Plan and stream outlive the table.
+    /// Plan and stream must outlive the table.
     LiveTable(const simulation::Plan& plan, std::ostream& stream, std::optional<std::size_t> width);
     ~LiveTable() override;
 
@@ -35,7 +35,7 @@ private:
     const simulation::Plan& itsPlan;
     std::ostream& itsStream;
     std::optional<std::size_t> itsWidth;
-    std::optional<simulation::Point> itsHeading;  // a point of the curve that the last heading is for
+    std::optional<simulation::Point> itsHeading;  // a point of the curve under the last heading
     std::chrono::steady_clock::time_point itsLastMove;
     bool itsHasMovingLine = false;
 };

@@ -1,4 +1,4 @@
-// Merge: the subcommand that joins the results of several runs.
+// Merge: the subcommand that merges the results of several runs.
 #include "Merge.h"
 
 #include <iostream>
@@ -22,7 +22,7 @@ struct Options {
     PictureOptions pictures;
 };
 
-/// Writes the results as a file or, if nothing else is asked for, as CSV to standard output.
+/// Writes the results to a file or, if no other output is requested, as CSV to standard output.
 void write(const Options& options, const simulation::Results& results)
 {
     if (!options.output.empty()) {

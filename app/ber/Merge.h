@@ -1,4 +1,4 @@
-// Merge: the subcommand that joins the results of several runs.
+// Merge: the subcommand that merges the results of several runs.
 #ifndef MORVIK_APP_BER_MERGE_H
 #define MORVIK_APP_BER_MERGE_H
 

@@ -1,4 +1,4 @@
-// Pictures: what is drawn of results: those of a run, or joined ones.
+// Pictures: draws the results of one run or of several merged ones.
 #include "Pictures.h"
 
 #include <algorithm>
@@ -54,7 +54,7 @@ std::string rangeText(const std::vector<simulation::ResultRow>& rows)
            base::thousandthsText(most->point.milliDecibels) + " dB";
 }
 
-/// Throws Error if what is written to the one file, if any, would take the place of the other.
+/// Throws Error if both files are given and writing one would replace the other.
 void checkDistinct(const std::string& file, const std::string& other)
 {
     if (!file.empty() && !other.empty() && base::isSamePlace(file, other)) {

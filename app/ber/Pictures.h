@@ -1,4 +1,4 @@
-// Pictures: what is drawn of results: those of a run, or joined ones.
+// Pictures: draws the results of one run or of several merged ones.
 #ifndef MORVIK_APP_BER_PICTURES_H
 #define MORVIK_APP_BER_PICTURES_H
 
@@ -11,11 +11,11 @@
 
 namespace morvik {
 
-/// The files that are asked for; empty ones are not.
+/// The requested files; empty if not requested.
 struct PictureOptions {
     std::string plot;
     std::string report;
-    std::vector<std::string> references;  // files with curves to compare with
+    std::vector<std::string> references;  // files of curves for comparison
 
     /// Whether anything is to be drawn.
     bool isAskedFor() const
@@ -24,17 +24,17 @@ struct PictureOptions {
     }
 };
 
-/// Adds --plot, --report and --reference, which fill in `options`.
+/// Adds --plot, --report and --reference, which set `options`.
 void addPictureOptions(CLI::App& command, PictureOptions& options);
 
-/// The pictures of some results.
+/// Draws results as a plot and a report.
 class Pictures {
 public:
-    /// Reads the references and finds out whether the files can be written, before a long run, and beside the file of
-    /// the results, if there is one; none of them may be one of the inputs. Throws base::Error.
+    /// Reads the references and checks, before a long run, that the files can be written and differ from each other,
+    /// from `output`, if there is one, and from the inputs. Throws base::Error.
     Pictures(const PictureOptions& options, const std::string& output, std::vector<std::string> inputs);
 
-    /// Draws the results, of which there are some. `points` tells how many they are. Throws base::Error.
+    /// Draws the results, at least one. `points` describes their number. Throws base::Error.
     void draw(const simulation::Results& results, const std::string& points) const;
 
 private:
