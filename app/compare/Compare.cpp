@@ -1,4 +1,4 @@
-// Compare: the subcommand that finds where a simulation of hardware leaves the model.
+// Compare: the subcommand that finds where a hardware simulation departs from the model.
 #include "Compare.h"
 
 #include <iostream>
@@ -44,7 +44,7 @@ comparison::NameMap readMap(const std::string& file)
     return comparison::readNameMap(input.stream(), input.name());
 }
 
-/// Whether the dump is a VCD: by the option, or by the end of the file's name.
+/// Whether the dump is a VCD, by the option or the file name extension.
 bool isVcd(const Options& options)
 {
     const std::string ending = ".vcd";
@@ -73,7 +73,7 @@ int compare(const Options& options)
                           (found.unknown() > 0 ? ": holds no known value" : ": holds no value that the core computes"));
     }
     const comparison::Coverage coverage = comparison::coverageOf(model, dump);
-    // Few values may agree with another run by chance.
+    // A few values may match another run by chance.
     constexpr std::uint64_t telling = 64;
     const auto otherRuns = found.knownDifferent() > 0 && found.knownCompared() >= telling
                                ? findOtherRuns(run, dump.values)

@@ -1,4 +1,4 @@
-// Compare: the subcommand that finds where a simulation of hardware leaves the model.
+// Compare: the subcommand that finds where a hardware simulation departs from the model.
 #ifndef MORVIK_APP_COMPARE_COMPARE_H
 #define MORVIK_APP_COMPARE_COMPARE_H
 

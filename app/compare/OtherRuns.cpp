@@ -1,4 +1,4 @@
-// OtherRuns: what the model would have to be given, so that it computes a dump that is not the one of its options.
+// OtherRuns: finds other options or inputs with which the model reproduces a dump.
 #include "OtherRuns.h"
 
 #include <filesystem>
@@ -16,8 +16,8 @@ namespace morvik {
 
 namespace {
 
-/// "--num-pu 4 or 8", the units with which a core computes the dump; an empty text when those of `run` do; nothing when
-/// none do.
+/// "--num-pu 4 or 8", the unit counts whose core computes the dump; empty text if that of `run` does; nothing if none
+/// do.
 std::optional<std::string> unitsThatFit(ComparedRun run, const comparison::Values& dump)
 {
     std::string units;
@@ -34,7 +34,7 @@ std::optional<std::string> unitsThatFit(ComparedRun run, const comparison::Value
     return units.empty() ? std::nullopt : std::optional(units);
 }
 
-/// Another number of units alone tells more than one with another algorithm.
+/// Prefers another unit count alone to another algorithm: it is the stronger finding.
 std::vector<std::string> findCores(const ComparedRun& run, const comparison::Values& dump)
 {
     std::vector<std::string> found;
@@ -53,14 +53,14 @@ std::vector<std::string> findCores(const ComparedRun& run, const comparison::Val
     return found;
 }
 
-constexpr std::size_t mostBlocks = 4;  ///< that are named
+constexpr std::size_t mostBlocks = 4;  ///< named at most
 
 std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Values& dump)
 {
     std::vector<std::string> found;
     std::error_code ignored;
     if (!std::filesystem::is_regular_file(run.file, ignored)) {
-        return found;  // it can be read but once
+        return found;  // it cannot be read again
     }
     try {
         base::InputFile input(run.file);
@@ -73,12 +73,12 @@ std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Va
             }
         }
     } catch (const base::Error&) {
-        // What follows the block in the file need not be blocks.
+        // The rest of the file need not hold valid blocks.
     }
     return found;
 }
 
-/// One mistake at a time, of those that leave a block of this size.
+/// Each single mistake that preserves the block size.
 std::vector<diagnosis::Mistakes> allMistakes()
 {
     std::vector<diagnosis::Mistakes> all;

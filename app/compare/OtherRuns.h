@@ -1,4 +1,4 @@
-// OtherRuns: what the model would have to be given, so that it computes a dump that is not the one of its options.
+// OtherRuns: finds other options or inputs with which the model reproduces a dump.
 #ifndef MORVIK_APP_COMPARE_OTHERRUNS_H
 #define MORVIK_APP_COMPARE_OTHERRUNS_H
 
@@ -12,7 +12,7 @@
 
 namespace morvik {
 
-/// What a dump has been compared with.
+/// The run that a dump was compared with.
 struct ComparedRun {
     std::string file;  ///< of blocks
     std::uint32_t number = 0;
@@ -20,8 +20,8 @@ struct ComparedRun {
     veltra_ip_morvik_v1_0_generics generics;
 };
 
-/// The other cores, the other blocks of the file and the mistakes in the block with which the model computes every
-/// value of the dump, as "with --algorithm table".
+/// Finds the other cores, the other blocks of the file and the mistakes in the block with which the model computes
+/// every value of the dump. Each is worded as in "with --algorithm table".
 std::vector<std::string> findOtherRuns(const ComparedRun& run, const comparison::Values& dump);
 
 }  // namespace morvik
