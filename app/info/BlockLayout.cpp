@@ -1,4 +1,4 @@
-// BlockLayout: how the core works on a block of K bits, as the model's own components tell it.
+// BlockLayout: how the core processes a block of K bits, from the model's own components.
 #include "BlockLayout.h"
 
 #include <memory>

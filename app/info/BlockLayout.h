@@ -1,4 +1,4 @@
-// BlockLayout: how the core works on a block of K bits, as the model's own components tell it.
+// BlockLayout: how the core processes a block of K bits, from the model's own components.
 #ifndef MORVIK_APP_INFO_BLOCKLAYOUT_H
 #define MORVIK_APP_INFO_BLOCKLAYOUT_H
 
@@ -14,11 +14,11 @@ struct BlockLayout {
     std::uint32_t K = 0;
     std::uint32_t f1 = 0;
     std::uint32_t f2 = 0;
-    std::vector<unsigned> interleaver;  ///< entry i is the bit that the second encoder takes as its i-th one
+    std::vector<unsigned> interleaver;  ///< entry i is the index of the second encoder's i-th input bit
     std::vector<rules::Cut> cuts;       ///< for 2, 4 and 8 units
 };
 
-/// Of a block size; throws std::invalid_argument for another K.
+/// Throws std::invalid_argument unless K is a block size.
 BlockLayout layoutOf(std::uint32_t K);
 
 /// A fixed-point format of the core.

@@ -1,4 +1,4 @@
-// Info: the subcommand that tells what the core makes of a block size.
+// Info: the subcommand that shows how the core handles a block size.
 #include "Info.h"
 
 #include <algorithm>
@@ -195,7 +195,7 @@ std::string generalInformation(const Options& options)
     return object.dump(2) + '\n';
 }
 
-/// The sizes around a K that is none.
+/// The sizes next to a K that is not a block size.
 std::string neighbours(std::uint32_t K)
 {
     const auto* const above = std::find_if(

@@ -1,4 +1,4 @@
-// Info: the subcommand that tells what the core makes of a block size.
+// Info: the subcommand that shows how the core handles a block size.
 #ifndef MORVIK_APP_INFO_INFO_H
 #define MORVIK_APP_INFO_INFO_H
 

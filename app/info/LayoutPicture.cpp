@@ -1,4 +1,4 @@
-// LayoutPicture: how a block is cut into segments and windows, and the order in which they are computed.
+// LayoutPicture: draws the segments and windows of a block and the order of their computation.
 #include "LayoutPicture.h"
 
 #include <cmath>
@@ -50,7 +50,7 @@ std::vector<Panel> panelsOf(const BlockLayout& layout)
     return panels;
 }
 
-/// From dark to light over the rows, of which two are far apart.
+/// Shades the rows from dark to light; two rows get the extremes.
 std::string shadeOf(unsigned row, unsigned rows)
 {
     const double lightness = rows > 1 ? static_cast<double>(row) / (rows - 1) : 0;
@@ -65,7 +65,7 @@ std::string shadeOf(unsigned row, unsigned rows)
     return text;
 }
 
-/// One panel, whose segments begin at the height `top`.
+/// Paints one panel, whose segments begin at height `top`.
 class Painter {
 public:
     Painter(const rules::Cut& cut, double top, Drawing& drawing) : itsCut(cut), itsTop(top), itsDrawing(drawing) {}
@@ -80,7 +80,7 @@ public:
     }
 
 private:
-    /// Of a step within its segment.
+    /// The x coordinate of a step within its segment.
     double across(std::uint32_t step) const
     {
         return left + (right - left) * step / itsCut.segmentLength();

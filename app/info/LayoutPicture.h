@@ -1,4 +1,4 @@
-// LayoutPicture: how a block is cut into segments and windows, and the order in which they are computed.
+// LayoutPicture: draws the segments and windows of a block and the order of their computation.
 #ifndef MORVIK_APP_INFO_LAYOUTPICTURE_H
 #define MORVIK_APP_INFO_LAYOUTPICTURE_H
 
@@ -9,8 +9,8 @@
 
 namespace morvik {
 
-/// A panel for each way in which the block is divided: unit counts that divide it alike share one. A line is a segment,
-/// a box a window with its number in the order, the shade its row.
+/// One panel for each division of the block: unit counts that divide it alike share one. Lines are segments; boxes are
+/// windows, numbered in processing order and shaded by row.
 report::Drawing pictureOf(const BlockLayout& layout);
 
 }  // namespace morvik
