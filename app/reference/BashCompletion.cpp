@@ -1,4 +1,4 @@
-// BashCompletion: what lets bash complete the arguments of a program.
+// BashCompletion: generates a program's completion for bash.
 #include <algorithm>
 #include <map>
 
@@ -24,7 +24,7 @@ std::string functionOf(const CommandFacts& program)
     return name;
 }
 
-/// The command that fills in a value; nothing where any text may stand.
+/// The command that completes a value; empty for free text.
 std::string actionFor(const OptionFacts& option, const std::string& function)
 {
     if (!option.words.empty()) {
@@ -42,7 +42,7 @@ std::string actionFor(const OptionFacts& option, const std::string& function)
     return "";
 }
 
-/// The cases of one subcommand: the values of options, by what is done for them.
+/// The cases of one subcommand for option values, grouped by action.
 std::string valueCases(const CommandFacts& command, const std::string& function)
 {
     std::map<std::string, std::vector<std::string>> optionsOf;
@@ -61,7 +61,7 @@ std::string valueCases(const CommandFacts& command, const std::string& function)
     return text;
 }
 
-/// The case of one subcommand: what can stand where no value of an option is due.
+/// The case of one subcommand for words other than option values.
 std::string argumentCase(const CommandFacts& command, const std::string& function)
 {
     std::vector<std::string> names;

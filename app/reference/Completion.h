@@ -1,4 +1,4 @@
-// Completion: what lets shells complete the arguments of a program.
+// Completion: generates shell completions for a program.
 #ifndef MORVIK_APP_REFERENCE_COMPLETION_H
 #define MORVIK_APP_REFERENCE_COMPLETION_H
 
@@ -8,10 +8,10 @@
 
 namespace morvik::reference {
 
-/// A function for bash, on those of the package bash-completion.
+/// A bash function that uses those of the package bash-completion.
 std::string bashCompletion(const CommandFacts& program);
 
-/// A function for the completion system of zsh.
+/// A function for zsh's completion system.
 std::string zshCompletion(const CommandFacts& program);
 
 }  // namespace morvik::reference

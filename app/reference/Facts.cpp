@@ -1,4 +1,4 @@
-// Facts: what there is to tell of a command's arguments.
+// Facts: describes a command's arguments as plain data.
 #include "Facts.h"
 
 #include <algorithm>
@@ -10,7 +10,7 @@ namespace morvik::reference {
 
 namespace {
 
-/// The longest name, by which other options refer to this one.
+/// The name by which other options refer to this one, a long one if there is one.
 std::string mainName(const CLI::Option& option)
 {
     return option.get_lnames().empty() ? option.get_name() : "--" + option.get_lnames().front();
@@ -23,7 +23,7 @@ std::vector<std::string> mainNames(const std::set<CLI::Option*>& options)
     for (const CLI::Option* const option : options) {
         names.push_back(mainName(*option));
     }
-    std::sort(names.begin(), names.end());  // a set of pointers has another order in every run
+    std::sort(names.begin(), names.end());  // the order of a set of pointers varies between runs
     return names;
 }
 
@@ -42,7 +42,7 @@ std::vector<std::string> namesOf(const CLI::Option& option)
     return names;
 }
 
-/// The names of values tell what they stand for: FILE, FILE.csv, DIR.
+/// Derives the kind of files from the name of the value: FILE, FILE.csv, DIR.
 void tellFiles(OptionFacts& facts)
 {
     if (facts.value.rfind("FILE", 0) == 0) {

@@ -1,4 +1,4 @@
-// Facts: what there is to tell of a command's arguments, as plain data.
+// Facts: describes a command's arguments as plain data.
 #ifndef MORVIK_APP_REFERENCE_FACTS_H
 #define MORVIK_APP_REFERENCE_FACTS_H
 
@@ -8,22 +8,22 @@
 
 namespace morvik::reference {
 
-/// What an option's value names.
+/// The files that an option's value names.
 enum class Files { none, any, folders };
 
 struct OptionFacts {
-    std::vector<std::string> names;  // such as -h and --help; that of a positional argument has no dashes
+    std::vector<std::string> names;  // such as -h and --help; without dashes for a positional argument
     std::string value;               // a name for the value, empty for a flag
     std::string description;
     std::string defaultValue;
-    std::vector<std::string> words;  // values to offer
-    bool isList = false;             // whether the value is a list of them, with commas
+    std::vector<std::string> words;  // values to complete
+    bool isList = false;             // whether the value is a comma-separated list of them
     bool isRequired = false;
     bool isRepeatable = false;
     std::vector<std::string> needs;     // names of options
     std::vector<std::string> excludes;  // the same
     Files files = Files::none;
-    std::string ending;  // of such files, as .csv; empty for any
+    std::string ending;  // their extension, such as .csv; empty for any
 };
 
 struct CommandFacts {
@@ -34,7 +34,7 @@ struct CommandFacts {
     std::string footer;  // the end of the help text
     std::vector<CommandFacts> subcommands;
 
-    /// The name without that of the program before it.
+    /// The name without the program's before it.
     std::string ownName() const;
 };
 

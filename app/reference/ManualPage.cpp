@@ -1,4 +1,4 @@
-// ManualPage: the pages of a program for man(1), in the macros of man(7).
+// ManualPage: generates a program's pages for man(1), in the macros of man(7).
 #include "ManualPage.h"
 
 #include <algorithm>
@@ -12,8 +12,8 @@ namespace {
 
 // ---- Text
 
-/// As roff reads it: no letter is a command, and quotes and circumflexes stay what they are. With `isCode`, hyphens are
-/// those that can be copied into a shell.
+/// Escapes text for roff: no letter acts as a command, and quotes and circumflexes stay as they are. With `isCode`,
+/// hyphens can be copied into a shell.
 std::string escaped(const std::string& text, bool isCode)
 {
     std::string result;
@@ -49,7 +49,7 @@ std::string code(const std::string& text)
     return escaped(text, true);
 }
 
-/// Running text, in one line. A word that begins with a dash, behind quotes and brackets, is an option or a number.
+/// Text filled into one line. A word that begins with a dash, after quotes and brackets, is an option or a number.
 std::string prose(const std::string& text)
 {
     std::istringstream words(text);
@@ -96,12 +96,12 @@ std::string listed(const std::vector<std::string>& names)
     return list;
 }
 
-// ---- The end of the help text
+// ---- The footer of the help text
 
 struct Explanation {
     std::vector<std::string> paragraphs;
     std::string exitStatus;
-    std::vector<std::string> examples;  // paragraphs, without the word that opens them
+    std::vector<std::string> examples;  // paragraphs, without their first word
 };
 
 std::vector<std::string> paragraphsOf(const std::string& text)
@@ -160,7 +160,7 @@ std::string heading(const CommandFacts& command, const std::string& version)
            version + "\" \"morvik\"\n.SH NAME\n" + code(name) + " \\- " + prose(summary) + '\n';
 }
 
-/// The line of the synopsis.
+/// The synopsis.
 std::string usage(const CommandFacts& command)
 {
     std::string line = bold(command.name) + " [" + italic("OPTIONS") + ']';
@@ -235,7 +235,7 @@ std::string subcommands(const CommandFacts& program)
     return text;
 }
 
-/// The other pages of the program and, since they belong together, those of both programs.
+/// The program's other pages and, since they belong together, those of both programs.
 std::string seeAlso(const CommandFacts& program, const CommandFacts& command)
 {
     std::vector<std::string> pages = {"morvik", "morvik-mpi"};
@@ -275,7 +275,7 @@ std::string pageOf(const CommandFacts& program, const CommandFacts& command, con
            sections(command, explanation) + seeAlso(program, command);
 }
 
-/// A program with its only subcommand, as one command.
+/// One page for a program and its only subcommand.
 std::string singlePage(const CommandFacts& program, const std::string& version)
 {
     CommandFacts command = program.subcommands.front();

@@ -1,4 +1,4 @@
-// ManualPage: the pages of a program for man(1).
+// ManualPage: generates a program's pages for man(1).
 #ifndef MORVIK_APP_REFERENCE_MANUALPAGE_H
 #define MORVIK_APP_REFERENCE_MANUALPAGE_H
 
@@ -9,11 +9,11 @@
 
 namespace morvik::reference {
 
-/// The pages by the names of their files: one for the program and one for each subcommand. A program that has a single
-/// subcommand is told on one page.
+/// Returns the pages by file name: one for the program and one for each subcommand. A program with a single subcommand
+/// gets one page for both.
 ///
-/// The end of a help text has the explanation, in paragraphs. From "Exit status:" to the end of its paragraph, and the
-/// paragraphs that begin with "Example:", become sections of their own.
+/// The footer of a help text holds the explanation, in paragraphs. The text from "Exit status:" to the end of its
+/// paragraph, and paragraphs that begin with "Example:", become sections of their own.
 std::map<std::string, std::string> manualPages(const CommandFacts& program, const std::string& version);
 
 }  // namespace morvik::reference

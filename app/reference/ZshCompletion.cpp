@@ -1,4 +1,4 @@
-// ZshCompletion: what lets zsh complete the arguments of a program, by its function _arguments.
+// ZshCompletion: generates a program's completion for zsh, with its function _arguments.
 #include <algorithm>
 
 #include "Completion.h"
@@ -7,7 +7,7 @@ namespace morvik::reference {
 
 namespace {
 
-/// With a backslash before each of the letters.
+/// Puts a backslash before each of the letters.
 std::string escaped(const std::string& text, const std::string& letters)
 {
     std::string result;
@@ -17,7 +17,7 @@ std::string escaped(const std::string& text, const std::string& letters)
     return result;
 }
 
-/// In single quotes.
+/// Puts the text in single quotes.
 std::string quoted(const std::string& text)
 {
     std::string result;
@@ -27,7 +27,7 @@ std::string quoted(const std::string& text)
     return '\'' + result + '\'';
 }
 
-/// What fills in a value, behind its name.
+/// The action that completes a value; follows its name.
 std::string actionFor(const OptionFacts& option)
 {
     std::string words;
@@ -45,7 +45,7 @@ std::string actionFor(const OptionFacts& option)
     case Files::none:
         break;
     }
-    return " ";  // a message with the name of the value, and nothing else
+    return " ";  // only shows the name of the value
 }
 
 std::string valueOf(const OptionFacts& option)
@@ -53,10 +53,10 @@ std::string valueOf(const OptionFacts& option)
     return ':' + escaped(option.value, ":\\[]") + ':' + actionFor(option);
 }
 
-/// The specifications of an option, one for each of its names.
+/// The specifications of an option, one per name.
 std::string optionLines(const OptionFacts& option)
 {
-    std::string shut;  // what can no longer stand beside it
+    std::string shut;  // what it excludes from here on
     for (const auto& names : {option.names, option.excludes}) {
         for (const std::string& name : names) {
             shut += (shut.empty() ? "" : " ") + name;

@@ -1,5 +1,5 @@
-// morvik_reference: writes the manual pages and the completions of the commands, from the options that they take.
-//   morvik_reference FOLDER     writes FOLDER/PROGRAM/share/..., as it is to be installed
+// morvik_reference: generates the manual pages and completions of the commands from their options.
+//   morvik_reference FOLDER     writes FOLDER/PROGRAM/share/..., ready to install
 #include <exception>
 #include <filesystem>
 #include <iostream>
@@ -25,7 +25,7 @@ void writeReference(const fs::path& folder, const morvik::Program& program)
 {
     const morvik::reference::CommandFacts facts = morvik::reference::factsOf(*program.arguments);
     const fs::path share = folder / facts.name / "share";
-    fs::remove_all(folder / facts.name);  // pages of subcommands that are no more
+    fs::remove_all(folder / facts.name);  // removes pages of former subcommands
     for (const auto& [name, page] : manualPages(facts, MORVIK_VERSION)) {
         write(share / "man/man1" / name, page);
     }
