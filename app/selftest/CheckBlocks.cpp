@@ -14,10 +14,10 @@ namespace {
 
 constexpr std::uint64_t seed = 36212;
 constexpr double scale = 8;
-/// Below what any size needs at a few iterations: most blocks keep wrong bits, whose ratios depend on everything.
+/// Below what any size needs at few iterations: most blocks keep bit errors, whose ratios depend on everything.
 constexpr int milliDecibels = 400;
 
-/// The block's values anew, each with the same probability.
+/// Replaces the values of the block by uniformly distributed ones.
 void randomise(CheckBatch& batch, std::uint32_t block)
 {
     const link::RandomKey key = link::randomKey(seed);
@@ -33,7 +33,7 @@ void randomise(CheckBatch& batch, std::uint32_t block)
 
 CheckBatch batchOf(unsigned K, std::uint32_t number)
 {
-    constexpr std::uint32_t lanes = 64;  // of the widest kernel: so many blocks of one segment each
+    constexpr std::uint32_t lanes = 64;  // of the widest kernel, each with a block of one segment
     CheckBatch batch;
     batch.K = K;
     batch.blocks = 1 + lanes * 40 / K;

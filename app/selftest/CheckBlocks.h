@@ -29,19 +29,19 @@ private:
 /// Sixteen hexadecimal digits.
 std::string hexadecimal(std::uint64_t digest);
 
-/// Blocks of one size that are decoded in one call.
+/// Blocks of one size, decoded in one call.
 struct CheckBatch {
     unsigned K = 0;
     std::uint32_t blocks = 0;
     std::uint32_t iterations = 0;
-    std::array<std::vector<std::int8_t>, 3> streams;  ///< K + 4 soft values of each block
+    std::array<std::vector<std::int8_t>, 3> streams;  ///< K + 4 soft values per block
 };
 
-/// Some blocks of each of the 188 sizes: code words in noise in which decisions hang by a hair, and, the last block of
-/// a batch, random values from -128 to 127. There are as many as the widest vectors take at once, and one more.
+/// A batch for each of the 188 sizes: code words in noise with marginal decisions and, as the last block, random values
+/// from -128 to 127. A batch has one block more than the widest vectors take at once.
 std::vector<CheckBatch> checkBatches();
 
-/// Of all soft values.
+/// The digest of all soft values.
 std::uint64_t digestOf(const std::vector<CheckBatch>& batches);
 
 }  // namespace morvik::selftest

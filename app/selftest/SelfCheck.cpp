@@ -1,4 +1,4 @@
-// SelfCheck: compares what this machine decodes with digests of what every machine has to decode.
+// SelfCheck: compares what this machine decodes with the digests that every machine must produce.
 #include "SelfCheck.h"
 
 #include <algorithm>
@@ -125,7 +125,7 @@ Outcome checkInstructionSet(const std::string& name,
 
 Decode libraryDecode(int numPu, int algorithm, const std::string& instructionSet)
 {
-    // What the library says of an instruction set that the machine lacks is no news here.
+    // Drops the library's message about an instruction set that the machine lacks.
     std::ostream silence(nullptr);
     try {
         Decoder(genericsOf(numPu, algorithm), silence).useInstructionSet(instructionSet);

@@ -1,4 +1,4 @@
-// SelfCheck: compares what this machine decodes with digests of what every machine has to decode.
+// SelfCheck: compares what this machine decodes with the digests that every machine must produce.
 #ifndef MORVIK_APP_SELFTEST_SELFCHECK_H
 #define MORVIK_APP_SELFTEST_SELFCHECK_H
 
@@ -12,7 +12,7 @@
 
 namespace morvik::selftest {
 
-/// What the core is built with, as far as it decides about bits, and the digest of all decisions and log-likelihood
+/// The core's configuration, as far as it affects decoded bits, and the digest of all decisions and log-likelihood
 /// ratios of the check blocks.
 struct Expectation {
     int numPu;
@@ -20,30 +20,29 @@ struct Expectation {
     std::uint64_t digest;
 };
 
-/// The digests that are promised.
 struct Promise {
     std::uint64_t blocks;  ///< of the check blocks themselves
     std::array<Expectation, 9> configurations;
 };
 extern const Promise promise;
 
-/// Decisions and ratios of a batch.
+/// The decisions and ratios of a batch.
 struct Decided {
     std::vector<std::uint8_t> bits;
     std::vector<std::int16_t> ratios;
 };
 
-/// Decodes check batches in one configuration, by one way of decoding.
+/// Decodes check batches in one configuration, in one way.
 using Decode = std::function<void(const CheckBatch& batch, Decided& decided)>;
 
-/// Makes that; nothing if the machine lacks the instruction set.
+/// Creates a Decode; empty if the machine lacks the instruction set.
 using MakeDecode = std::function<Decode(int numPu, int algorithm, const std::string& instructionSet)>;
 
-/// By the batch interface of the library, with 8-, 16- and 32-bit soft values in turn. Throws Refusal where the library
-/// refuses a configuration or a block.
+/// Decodes with the library's batch interface, with 8-, 16- and 32-bit soft values in turn. Throws std::runtime_error
+/// if the library refuses a configuration or a block.
 Decode libraryDecode(int numPu, int algorithm, const std::string& instructionSet);
 
-/// A configuration that was decoded otherwise.
+/// A configuration with a wrong digest.
 struct Difference {
     int numPu;
     int algorithm;
@@ -51,32 +50,31 @@ struct Difference {
     std::uint64_t found;
 };
 
-/// What came of one instruction set.
+/// The result of one instruction set.
 struct Outcome {
     std::string instructionSet;
     bool available = false;
-    std::size_t configurations = 0;  ///< that were decoded
+    std::size_t configurations = 0;  ///< decoded
     std::vector<Difference> differences;
     double seconds = 0;
 };
 
-/// All of a check.
+/// The results of a check.
 struct Findings {
-    std::string inUse;  ///< the instruction set that a decoder takes by itself
+    std::string inUse;  ///< the instruction set that a decoder uses by default
     std::uint64_t blocks = 0;
     std::uint64_t bits = 0;  ///< in all blocks
     std::uint64_t blockDigest = 0;
     bool blocksRight = false;
-    std::vector<Outcome> outcomes;  ///< of each instruction set, the component path last
+    std::vector<Outcome> outcomes;  ///< one per instruction set, the component path last
 
-    /// Whether the machine has to have the instruction set of an outcome: the one in use and those that every machine
-    /// has.
+    /// Whether the machine must have this instruction set: the one in use and those that every machine has.
     bool needs(const Outcome& outcome) const;
 
-    /// The configurations that were decoded, by all instruction sets.
+    /// The number of configurations decoded, over all instruction sets.
     std::size_t configurations() const;
 
-    /// Whether everything that has to be there has been decoded, in all configurations, and nothing differs.
+    /// Whether all that is required was decoded, in all configurations, and nothing differs.
     bool right() const;
 };
 

@@ -1,4 +1,4 @@
-// SelfTest: the subcommand that proves that library and processor give the promised bits.
+// SelfTest: the subcommand that checks that library and processor produce the promised bits.
 #include "SelfTest.h"
 
 #include <cstdio>
