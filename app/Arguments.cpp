@@ -1,4 +1,4 @@
-// Arguments: what option values are allowed, and how a refusal reads.
+// Arguments: validates option values and words the refusals.
 #include "Arguments.h"
 
 #include <iterator>
@@ -13,7 +13,7 @@ namespace morvik {
 
 namespace {
 
-/// The name of a validator is nowhere shown: it carries the words to offer.
+/// Validator names are never shown; they carry the words to offer.
 std::string wordsAsName(const std::vector<std::string>& words)
 {
     std::string name;
@@ -83,7 +83,7 @@ std::vector<std::string> offered(CLI::Option& option)
             std::istringstream name(option.get_validator(i)->get_name());
             words.insert(words.end(), std::istream_iterator<std::string>(name), {});
         }
-    } catch (const CLI::OptionNotFound&) {  // how the option says that there are no more validators
+    } catch (const CLI::OptionNotFound&) {  // thrown past the last validator
     }
     return words;
 }

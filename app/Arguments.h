@@ -1,4 +1,4 @@
-// Arguments: what option values are allowed, and how a refusal reads.
+// Arguments: validates option values and words the refusals.
 #ifndef MORVIK_APP_ARGUMENTS_H
 #define MORVIK_APP_ARGUMENTS_H
 
@@ -10,32 +10,32 @@
 
 namespace morvik {
 
-/// Allows decimal integers from `min` to `max`. For CLI::Option::transform.
+/// Accepts decimal integers from `min` to `max`. For CLI::Option::transform.
 ///
-/// The text is rewritten in its shortest form, because the argument parser would read a leading zero as octal.
+/// Rewrites the text in its shortest form, because the argument parser would read a leading zero as octal.
 CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max);
 
-/// Allows the first texts of the pairs, and replaces each by its second. For CLI::Option::transform.
+/// Accepts the first text of each pair and replaces it by the second. For CLI::Option::transform.
 CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& choices);
 
-/// Allows everything, and leaves the words for offered(). For CLI::Option::check of options that read their values
+/// Accepts everything and keeps the words for offered(). For CLI::Option::check of options that parse their values
 /// themselves.
 CLI::Validator offer(const std::vector<std::string>& words);
 
 /// The block sizes, for offer().
 std::vector<std::string> blockSizeWords();
 
-/// The words that a shell may offer as the option's value, from oneOf() or offer().
+/// The words that a shell may complete as the option's value, from oneOf() or offer().
 std::vector<std::string> offered(CLI::Option& option);
 
-/// Throws CLI::ValidationError: `text` is not allowed for the option, and what is instead.
+/// Throws CLI::ValidationError: `text` is not allowed for the option; `allowed` says what is.
 [[noreturn]] void refuse(const std::string& option, const std::string& text, const std::string& allowed);
 
-/// Reads a block size, for a list; otherwise refuses it for --block-size and names the nearest ones.
+/// Parses a block size and appends it. Otherwise refuses the text for --block-size and names the nearest sizes.
 void appendBlockSize(const std::string& text, std::vector<unsigned>& values);
 
-/// Reads an Eb/N0 into thousandths of a decibel; otherwise refuses it for --ebn0. `otherwise` is what messages say is
-/// allowed beside numbers.
+/// Parses an Eb/N0 into thousandths of a decibel. Otherwise refuses the text for --ebn0; `otherwise` names what else is
+/// allowed.
 int readMilliDecibels(const std::string& text, const std::string& otherwise = "");
 
 }  // namespace morvik

@@ -1,4 +1,4 @@
-// CommandLine: what happens between the arguments of a program and its exit status.
+// CommandLine: takes a program from its arguments to its exit status.
 #include "CommandLine.h"
 
 #include <exception>
@@ -12,7 +12,7 @@ namespace morvik {
 
 namespace {
 
-/// Writes the one line that ends a failed command.
+/// Reports the failure of a command in one line.
 int fail(const std::string& name, const std::string& what)
 {
     notice(name + ": " + what);
@@ -26,7 +26,7 @@ int reportUsage(const CLI::App& app, const CLI::ParseError& error)
     return fail(name, std::string(error.what()) + "; '" + name + " --help' tells what is allowed");
 }
 
-/// Whether all that was printed has arrived; what is left is lost otherwise, and nobody would know.
+/// Flushes standard output; a failure would otherwise go unnoticed. Returns the exit status.
 int finish(const std::string& name, int status)
 {
     return std::cout.flush() ? status : fail(name, base::fileError("<stdout>", "written").what());

@@ -1,4 +1,4 @@
-// CommandLine: what happens between the arguments of a program and its exit status.
+// CommandLine: takes a program from its arguments to its exit status.
 #ifndef MORVIK_APP_COMMANDLINE_H
 #define MORVIK_APP_COMMANDLINE_H
 
@@ -9,8 +9,8 @@
 
 namespace morvik {
 
-/// Runs the subcommand that the arguments name, or prints what they ask for, or in one line what is wrong with them.
-/// Returns the exit status.
+/// Runs the subcommand that the arguments name, prints the help or version they ask for, or reports bad usage in one
+/// line. Returns the exit status.
 int runCommandLine(CLI::App& app, const std::vector<Command>& commands, int argc, const char* const* argv);
 
 }  // namespace morvik

@@ -32,7 +32,7 @@ struct Options {
     std::uint32_t tracedPasses = 0;
 };
 
-/// What the line at the end tells.
+/// The figures of the closing line.
 struct Summary {
     std::uint32_t blocks = 0;
     std::size_t smallest = 0;
@@ -68,13 +68,13 @@ void print(const Summary& summary, bool withErrors)
         std::cerr << ", " << base::counted(summary.bitErrors, "bit error") << ", "
                   << base::counted(summary.blockErrors, "block error");
     }
-    const double seconds = std::max(summary.decoding.count(), 1e-9);  // the clock may stand still
+    const double seconds = std::max(summary.decoding.count(), 1e-9);  // the clock may not have advanced
     std::cerr.precision(2);
     std::cerr << ", " << std::fixed << static_cast<double>(summary.bits) / seconds / 1e6 << " Mbit/s" << std::endl;
 }
 
-/// The tag of a block. After the first one, tags count within the bits that the core carries, so that only a tag
-/// that the user gave can be truncated.
+/// The tag of a block. Tags after the first wrap at the width that the core carries, so that only a tag that the user
+/// gave can be truncated.
 std::uint32_t tagOf(std::uint32_t block, const Options& options)
 {
     const auto width = static_cast<std::uint32_t>(options.decoder.generics.C_TAG_WIDTH);
@@ -82,7 +82,7 @@ std::uint32_t tagOf(std::uint32_t block, const Options& options)
     return block == 0 ? options.firstTag : (options.firstTag + block) & carried;
 }
 
-/// Decodes the block that starts at the named place; a refusal becomes an error of that place.
+/// Decodes the block that starts at `place`; turns a refusal into an error there.
 void decodeBlock(Decoder& decoder,
                  const SoftValueReader& place,
                  const SoftBlock& block,
@@ -105,7 +105,7 @@ void decodeBlock(Decoder& decoder,
     }
 }
 
-/// A block's decisions as the line that goes out.
+/// A block's decisions as a line of output.
 std::string decisionLine(const std::vector<std::uint8_t>& bits)
 {
     std::string line;
@@ -116,7 +116,7 @@ std::string decisionLine(const std::vector<std::uint8_t>& bits)
     return line + '\n';
 }
 
-/// Does what may find a mistake in an input. What has been decided before it is kept.
+/// Runs an action that may find an error in an input. Keeps the decisions made before the error.
 template <class Action>
 auto keeping(base::OutputFile& output, Action action)
 try {
@@ -126,14 +126,13 @@ try {
     throw;
 }
 
-/// Decodes block after block.
 void decodeBlocks(const Options& options,
                   SoftValueReader& reader,
                   std::optional<ReferenceBits>& reference,
                   base::OutputFile& output,
                   Summary& summary)
 {
-    // The decoder's messages must never stand between decisions.
+    // Keep the decoder's messages out of the decisions.
     std::ostream& messages = output.isStandardOutput() ? std::cerr : std::cout;
     Decoder decoder(options.decoder.generics, messages);
     decoder.armTrace(options.tracedPasses);

@@ -1,4 +1,4 @@
-// DecoderOptions: the options that every decoding subcommand shares.
+// DecoderOptions: the options shared by all decoding subcommands.
 #include "DecoderOptions.h"
 
 #include "Arguments.h"

@@ -1,4 +1,4 @@
-// DecoderOptions: the options that every decoding subcommand shares.
+// DecoderOptions: the options shared by all decoding subcommands.
 #ifndef MORVIK_APP_DECODEROPTIONS_H
 #define MORVIK_APP_DECODEROPTIONS_H
 
@@ -13,10 +13,10 @@ namespace morvik {
 /// "2 units, scaled, 8 iterations".
 std::string coreText(const veltra_ip_morvik_v1_0_generics& generics, std::uint32_t iterations);
 
-/// The line that tells people which core a result is of: "core: 2 units, scaled, 8 iterations".
+/// The line that names the core behind a result: "core: 2 units, scaled, 8 iterations".
 std::string coreLine(const veltra_ip_morvik_v1_0_generics& generics, std::uint32_t iterations);
 
-/// Adds --num-pu, --algorithm, --iterations and --tag-width, which fill in `options`.
+/// Adds --num-pu, --algorithm, --iterations and --tag-width, which set `options`.
 void addDecoderOptions(CLI::App& command, DecoderOptions& options);
 
 }  // namespace morvik

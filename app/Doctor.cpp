@@ -1,4 +1,4 @@
-// Doctor: the subcommand that tells why blocks decode badly.
+// Doctor: the subcommand that diagnoses why blocks decode badly.
 #include "Doctor.h"
 
 #include <cstdint>
@@ -23,7 +23,7 @@ namespace morvik {
 
 namespace {
 
-constexpr int noMistakeFound = 3;  // an exit status of this subcommand alone
+constexpr int noMistakeFound = 3;  // an exit status of this subcommand only
 
 struct Options {
     std::string input = base::standardStream;
@@ -45,7 +45,6 @@ void check(const diagnosis::Case& read, const SoftValueReader& blocks, const Ref
     }
 }
 
-/// The cases to look at.
 struct Cases {
     std::vector<diagnosis::Case> cases;
     bool hasMore = false;  ///< the file has more blocks

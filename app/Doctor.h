@@ -1,4 +1,4 @@
-// Doctor: the subcommand that tells why blocks decode badly.
+// Doctor: the subcommand that diagnoses why blocks decode badly.
 #ifndef MORVIK_APP_DOCTOR_H
 #define MORVIK_APP_DOCTOR_H
 

@@ -1,4 +1,4 @@
-// Lists: option values with commas between them.
+// Lists: comma-separated option values.
 #ifndef MORVIK_APP_LISTS_H
 #define MORVIK_APP_LISTS_H
 
@@ -12,7 +12,7 @@
 
 namespace morvik {
 
-/// The texts between the separators, at least one.
+/// Splits a text at the separators into at least one part.
 inline std::vector<std::string> splitAt(char separator, std::string_view text)
 {
     std::vector<std::string> parts;
@@ -24,8 +24,8 @@ inline std::vector<std::string> splitAt(char separator, std::string_view text)
     return parts;
 }
 
-/// Adds an option that takes a list. `append` puts what one text between the commas stands for behind the values; when
-/// it cannot, it throws CLI::ValidationError, as does a value that comes twice. Values end up in ascending order.
+/// Adds an option that takes a comma-separated list. `append` parses one element and appends its values, or throws
+/// CLI::ValidationError, as does a duplicate value. The values end up in ascending order.
 template <class Value, class Append>
 CLI::Option* addListOption(CLI::App& command,
                            const std::string& name,

@@ -1,4 +1,4 @@
-// Notice: what a command tells beside its results.
+// Notice: prints text with control characters made visible.
 #include "Notice.h"
 
 #include <iostream>

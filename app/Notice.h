@@ -1,4 +1,4 @@
-// Notice: what a command tells beside its results.
+// Notice: prints text with control characters made visible.
 #ifndef MORVIK_APP_NOTICE_H
 #define MORVIK_APP_NOTICE_H
 
@@ -6,11 +6,10 @@
 
 namespace morvik {
 
-/// Writes one line on the standard error stream. What names and values bring along cannot work on the terminal.
+/// Writes one line to standard error. Control characters in names and values are escaped.
 void notice(const std::string& line);
 
-/// Writes text on standard output, of which that is true as well, but for the ends of its lines. Throws base::Error
-/// when it cannot be written.
+/// Writes text to standard output, escaped likewise except for line ends. Throws base::Error if it cannot be written.
 void print(const std::string& text);
 
 }  // namespace morvik

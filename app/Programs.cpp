@@ -1,4 +1,4 @@
-// Programs: what the commands `morvik` and `morvik-mpi` take.
+// Programs: the arguments of `morvik` and `morvik-mpi`.
 #include "Programs.h"
 
 #include "Decode.h"
@@ -16,7 +16,7 @@ Program::Program(const std::string& name, const std::string& description)
     : arguments(std::make_unique<CLI::App>(description, name))
 {
     arguments->set_version_flag("--version", name + " " MORVIK_VERSION, "Print the version and exit");
-    arguments->require_subcommand(0, 1);  // so that a file may bear the name of a subcommand
+    arguments->require_subcommand(0, 1);  // so that a file may be named like a subcommand
 }
 
 Program morvikProgram()
@@ -43,7 +43,7 @@ Program morvikMpiProgram(const decltype(BerMeans::makeWorkers)& makeWorkers)
     Program program("morvik-mpi", "The error-rate simulation of the morvik LTE turbo decoder, on many machines.");
     CLI::App& app = *program.arguments;
     app.footer("Example:\n  mpirun -n 16 morvik-mpi ber --block-size 512 --output k512.csv");
-    // What mpirun gives its processes as standard output is a terminal always, wherever its own goes.
+    // mpirun always gives its processes a terminal as standard output, even if its own is redirected.
     program.commands = {addBer(app, {"morvik-mpi ber", makeWorkers, false})};
     program.commands.front().arguments->get_option("--threads")->description("Threads of each rank, by default 1");
     return program;

@@ -1,5 +1,4 @@
-// Programs: what the commands `morvik` and `morvik-mpi` take. Their mains run them; pages and completions describe
-// them.
+// Programs: the arguments of `morvik` and `morvik-mpi`, for their mains, manual pages and completions.
 #ifndef MORVIK_APP_PROGRAMS_H
 #define MORVIK_APP_PROGRAMS_H
 
@@ -22,7 +21,7 @@ struct Program {
 
 Program morvikProgram();
 
-/// `makeWorkers` is as in BerMeans.
+/// `makeWorkers`: see BerMeans.
 Program morvikMpiProgram(const decltype(BerMeans::makeWorkers)& makeWorkers);
 
 }  // namespace morvik

@@ -1,4 +1,4 @@
-// ReferenceBits: the bits that were sent, from text with one line of 0 and 1 for each block.
+// ReferenceBits: reads the transmitted bits, one line of 0 and 1 per block.
 #include "ReferenceBits.h"
 
 #include <string_view>

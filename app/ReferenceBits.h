@@ -1,4 +1,4 @@
-// ReferenceBits: the bits that were sent, from text with one line of 0 and 1 for each block.
+// ReferenceBits: reads the transmitted bits, one line of 0 and 1 per block.
 #ifndef MORVIK_APP_REFERENCEBITS_H
 #define MORVIK_APP_REFERENCEBITS_H
 
@@ -13,23 +13,22 @@
 
 namespace morvik {
 
-/// Hands out the lines, or compares decisions with them, one after the other. What is wrong with a line is thrown as a
-/// base::Error.
+/// Returns the lines in turn or compares decisions with them. Throws base::Error if a line is wrong.
 class ReferenceBits {
 public:
-    /// `input` outlives the reader; `name` is what messages call it.
+    /// `input` must outlive the reader; messages call it `name`.
     ReferenceBits(std::istream& input, const std::string& name);
 
-    /// The bits of the next line, 0 or 1 each.
+    /// The bits of the next line, each 0 or 1.
     std::vector<std::uint8_t> next();
 
     /// The number of decisions that differ from the next line.
     std::size_t countErrors(const std::vector<std::uint8_t>& decisions);
 
-    /// Throws unless all lines have been compared; blank lines at the end do not count.
+    /// Throws unless all lines have been compared; ignores blank lines at the end.
     void expectEnd();
 
-    /// Throws an Error about the line that was read last.
+    /// Throws an Error about the line read last.
     [[noreturn]] void fail(const std::string& what) const;
 
 private:

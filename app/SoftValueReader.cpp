@@ -1,4 +1,4 @@
-// SoftValueReader: blocks of soft values from CSV text.
+// SoftValueReader: reads blocks of soft values from CSV.
 #include "SoftValueReader.h"
 
 #include <algorithm>

@@ -1,4 +1,4 @@
-// SoftValueReader: blocks of soft values from CSV text.
+// SoftValueReader: reads blocks of soft values from CSV.
 #ifndef MORVIK_APP_SOFTVALUEREADER_H
 #define MORVIK_APP_SOFTVALUEREADER_H
 
@@ -15,37 +15,37 @@
 
 namespace morvik {
 
-/// The first line of the text.
+/// The header line.
 constexpr char softValueHeader[] = "block,rsc1_sys,rsc1_par,rsc2_par";
 
-/// How many rows a block may have, for messages.
+/// The allowed numbers of rows in a block, for messages.
 constexpr char allowedRows[] = "K + 4 rows, K being one of the block sizes of 3GPP TS 36.212 (40 to 6144)";
 
 /// Reads one block at a time.
 ///
-/// After the header, each row has four decimal integers: the label of its block, a non-negative integer of any
-/// length, and three soft values of 32 bits. A row whose label differs, as text, from that of the row before starts
-/// a new block. Blank lines are allowed at the end only. Whatever is wrong is thrown as an Error naming the line.
+/// After the header, each row has four decimal integers: the label of its block, a non-negative integer of any length,
+/// and three 32-bit soft values. A row whose label differs, as text, from the previous one starts a new block. Blank
+/// lines are allowed only at the end. Throws Error, naming the line.
 class SoftValueReader {
 public:
-    /// Reads the header. `input` outlives the reader; `name` is what messages call it.
+    /// Reads the header. `input` must outlive the reader; messages call it `name`.
     SoftValueReader(std::istream& input, const std::string& name);
 
-    /// Reads the next block; false at the end. A mistake in the row that follows the block is left to the next call,
-    /// so that the block itself is not lost: only if that row has a label can one tell that it belongs to another.
+    /// Reads the next block; false at the end. Defers an error in the row after the block to the next call, so that the
+    /// block is not lost: only a valid label tells that the row belongs to another.
     bool next(SoftBlock& block);
 
-    /// Whether anything but blank lines follows the block just read.
+    /// Whether anything but blank lines follows this block.
     bool hasMore() const
     {
         return !itsAtEnd || itsMistake;
     }
 
-    /// Throws an Error about the first line of the block just read, or about the mistake that cut it short.
+    /// Throws an Error about the first line of this block, or the error that cut it short.
     [[noreturn]] void failBlock(const std::string& what) const;
 
 private:
-    /// Goes to the next row and reads its label; a mistake ends the rows and is kept.
+    /// Reads the next row and its label; an error ends the rows and is kept.
     void advance();
     void readLabel();
     void expectOnlyBlankLines();
@@ -56,12 +56,12 @@ private:
     base::CsvReader itsRow{itsLines};
     bool itsAtEnd = false;
     std::optional<base::Error> itsMistake;
-    std::string itsLabel;  // of the current row, which no block has yet
+    std::string itsLabel;  // of the current row, not yet in a block
     std::size_t itsFirstLine = 0;
 };
 
-/// The block of this number, from 0, in a file; "-" is the standard input. Throws an Error where there is none, or
-/// where its size is not one of the standard's.
+/// Reads block `number`, from 0, of a file; "-" is standard input. Throws an Error if there is none, or if its size is
+/// not one of the standard's.
 SoftBlock readBlock(const std::string& file, std::uint32_t number);
 
 }  // namespace morvik

@@ -1,4 +1,4 @@
-// Trace: the subcommand that writes the values inside of chosen passes.
+// Trace: the subcommand that writes the internal values of selected passes.
 #include "Trace.h"
 
 #include <algorithm>
@@ -34,7 +34,7 @@ struct Options {
     trace::Selection selection;
 };
 
-/// Reads --half-iterations, N or A:B; without it, all are selected.
+/// Applies --half-iterations, N or A:B; selects all without it.
 void selectPasses(const Options& options, trace::Selection& selection)
 {
     const std::uint32_t passes = 2 * options.decoder.iterations;
@@ -54,7 +54,7 @@ void selectPasses(const Options& options, trace::Selection& selection)
     selection.last = *last;
 }
 
-/// Appends the signals of a name: one, or all that differ from it in a number behind it.
+/// Appends the signal of this name, or all whose name is this one and a number.
 void appendSignals(const std::string& text, std::vector<unsigned>& signals)
 {
     const std::size_t before = signals.size();
@@ -72,7 +72,7 @@ void appendSignals(const std::string& text, std::vector<unsigned>& signals)
     }
 }
 
-/// What appendSignals() knows by name.
+/// The names that appendSignals() accepts.
 std::vector<std::string> signalWords()
 {
     std::vector<std::string> words(passSignals.begin(), passSignals.end());

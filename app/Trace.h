@@ -1,4 +1,4 @@
-// Trace: the subcommand that writes the values inside of chosen passes.
+// Trace: the subcommand that writes the internal values of selected passes.
 #ifndef MORVIK_APP_TRACE_H
 #define MORVIK_APP_TRACE_H
 

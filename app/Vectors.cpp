@@ -1,4 +1,4 @@
-// Vectors: the subcommand that makes stimulus and expected values for a test bench.
+// Vectors: the subcommand that generates stimulus and expected values for a test bench.
 #include "Vectors.h"
 
 #include <filesystem>
@@ -41,7 +41,7 @@ std::string listed(const std::vector<Value>& values, Text textOf)
     return list;
 }
 
-/// The command that makes the set again, but for the folder.
+/// The command that makes the set again, without the folder.
 std::string commandOf(const vectors::Settings& settings)
 {
     const auto itself = [](const std::string& text) {
@@ -100,7 +100,7 @@ int make(const Options& options)
     return success;
 }
 
-/// All that is read when the set is checked.
+/// All files that checking the set reads.
 std::vector<std::string> filesOf(const std::string& path, const vectors::Manifest& manifest)
 {
     const std::filesystem::path folder = path;
@@ -128,7 +128,7 @@ int check(const std::string& path)
     return success;
 }
 
-/// A set tells by itself what it was made with.
+/// Refuses other options beside --check: the set records how it was made.
 void expectNoOtherThanCheck(const CLI::App& command)
 {
     for (const CLI::Option* const option : command.get_options()) {

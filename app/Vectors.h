@@ -1,4 +1,4 @@
-// Vectors: the subcommand that makes stimulus and expected values for a test bench.
+// Vectors: the subcommand that generates stimulus and expected values for a test bench.
 #ifndef MORVIK_APP_VECTORS_H
 #define MORVIK_APP_VECTORS_H
 

@@ -8,7 +8,7 @@
 int main(int argc, char** argv)
 {
     morvik::base::prepareStandardStreams();
-    std::ios::sync_with_stdio(false);  // a trace writes millions of small pieces
+    std::ios::sync_with_stdio(false);  // a trace makes millions of small writes
 
     const morvik::Program program = morvik::morvikProgram();
     return morvik::runCommandLine(*program.arguments, program.commands, argc, argv);

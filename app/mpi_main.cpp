@@ -1,4 +1,4 @@
-// morvik-mpi: `morvik ber` on all processes of an MPI job. Rank 0 does all that the user sees.
+// morvik-mpi: `morvik ber` on all processes of an MPI job. Only rank 0 talks to the user.
 #include <algorithm>
 #include <chrono>
 #include <csignal>
@@ -20,7 +20,7 @@ using morvik::BerOptions;
 using morvik::simulation::MpiWorld;
 using morvik::simulation::Plan;
 
-/// MPI starts a process for each core, unless it is told otherwise.
+/// One by default: MPI starts a process per core unless told otherwise.
 unsigned threadsOf(const BerOptions& options)
 {
     return std::max(options.threads, 1U);
@@ -35,7 +35,7 @@ int runAsRankZero(MpiWorld& world, int argc, const char* const* argv)
     const morvik::Program program = morvik::morvikMpiProgram(makeWorkers);
     const int status = morvik::runCommandLine(*program.arguments, program.commands, argc, argv);
 
-    // The signal may have come because a rank is dead. The time is part of the second that mpirun grants.
+    // The signal may mean that a rank has died. The 500 ms are part of the second that mpirun grants.
     const bool isInterrupted = morvik::Interruption::signal() != 0;
     const auto patience = isInterrupted ? std::chrono::milliseconds(500) : std::chrono::minutes(1);
     if (!dismissOthers(world, patience)) {
@@ -44,7 +44,7 @@ int runAsRankZero(MpiWorld& world, int argc, const char* const* argv)
     return status;
 }
 
-/// Has the same arguments as rank 0. Whatever is wrong with them, rank 0 tells.
+/// Parses the same arguments as rank 0, which reports what is wrong with them.
 int runAsOtherRank(int argc, const char* const* argv)
 {
     BerOptions options;
@@ -58,7 +58,7 @@ int runAsOtherRank(int argc, const char* const* argv)
     } catch (const morvik::base::Error&) {
     }
     for (const int signal : {SIGINT, SIGTERM, SIGHUP}) {
-        std::signal(signal, SIG_IGN);  // rank 0 has them, too, and ends the work of all when its own is saved
+        std::signal(signal, SIG_IGN);  // rank 0 gets them, too, and stops all ranks once its work is saved
     }
     morvik::simulation::workForRankZero(plan ? &*plan : nullptr, threadsOf(options), options.instructionSet);
     return morvik::success;
