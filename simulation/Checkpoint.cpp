@@ -1,4 +1,4 @@
-// Checkpoint: how far a run has come, as text to go on from.
+// Checkpoint: the progress of a run as text, from which it can resume.
 #include "Checkpoint.h"
 
 #include <array>
@@ -128,7 +128,7 @@ std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::st
     if (text.substr(0, lineEnd + 1) != checkpointOpening(body)) {
         return std::nullopt;
     }
-    const Json json = base::parseJson('\n' + body, fileName);  // with the lines as in the file
+    const Json json = base::parseJson('\n' + body, fileName);  // keeps the file's line numbers
     const JsonMembers members(json, fileName);
     Checkpoint checkpoint;
     checkpoint.version = members.text("version");

@@ -1,4 +1,4 @@
-// Checkpoint: how far a run has come, as text to go on from.
+// Checkpoint: the progress of a run as text, from which it can resume.
 #ifndef MORVIK_SIMULATION_CHECKPOINT_H
 #define MORVIK_SIMULATION_CHECKPOINT_H
 
@@ -11,21 +11,21 @@
 namespace morvik::simulation {
 
 struct Checkpoint {
-    std::string version;  // of the plan, as is the command
+    std::string version;  // version and command are the plan's
     std::string command;
     std::vector<PointResult> ended;
     std::optional<PointResult> running;
-    std::vector<PointResult> begun;  // later points, which an earlier run with smaller limits has counted
+    std::vector<PointResult> begun;  // later points, counted by an earlier run with smaller limits
 };
 
-/// The line with the checksum that a checkpoint opens with, before the rest of it.
+/// The first line of a checkpoint: the checksum of its body.
 std::string checkpointOpening(const std::string& body);
 
-/// The text, which opens with a checksum.
+/// Formats a checkpoint, checksum first.
 std::string checkpointText(const Checkpoint& checkpoint);
 
-/// What checkpointText() has written; nothing if the text was damaged. Throws Error that opens with the file's name
-/// when the checksum is right, but the rest is no checkpoint.
+/// Parses the output of checkpointText(). Returns nothing if the text is damaged. Throws Error, prefixed with the
+/// file's name, if the checksum is right but the rest is no checkpoint.
 std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::string& fileName);
 
 }  // namespace morvik::simulation

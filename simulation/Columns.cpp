@@ -1,4 +1,4 @@
-// Columns: the columns of result files, and how a row is written into them and read back.
+// Columns: the columns of result files, with their readers and writers.
 #include "Columns.h"
 
 #include <algorithm>

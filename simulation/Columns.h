@@ -1,4 +1,4 @@
-// Columns: the columns of result files, and how a row is written into them and read back.
+// Columns: the columns of result files, with their readers and writers.
 #ifndef MORVIK_SIMULATION_COLUMNS_H
 #define MORVIK_SIMULATION_COLUMNS_H
 
@@ -10,20 +10,20 @@
 
 namespace morvik::simulation {
 
-/// A column. JSON distinguishes numbers, texts, and lists of integers, which have spaces between them here.
+/// A column. Its kind is its type in JSON; lists of integers are separated by spaces here.
 struct Column {
     enum class Kind { number, text, list };
 
     std::string_view name;
     Kind kind;
     std::string (*write)(const ResultRow& row);
-    bool (*read)(std::string_view text, ResultRow& row);  // false if the text cannot stand here
+    bool (*read)(std::string_view text, ResultRow& row);  // false if the text is not valid here
 };
 
-/// Whether the text can be a version: short, printable, and a field of CSV as it is.
+/// Whether the text is a valid version: short, printable, and a CSV field without quotes.
 bool isVersion(std::string_view version);
 
-/// All columns, in their order. Rates and bounds are written for the reader's sake; reading computes them anew.
+/// All columns, in order. Rates and bounds are written for the reader; reading recomputes them.
 const std::vector<Column>& columns();
 
 }  // namespace morvik::simulation

@@ -1,4 +1,4 @@
-// Confidence: how far off a simulated error rate may be.
+// Confidence: confidence intervals of simulated error rates.
 #include "Confidence.h"
 
 #include <algorithm>
@@ -10,16 +10,16 @@ namespace morvik::simulation {
 
 namespace {
 
-constexpr double missed = 0.05;  // the share of the intervals that may miss the rate
+constexpr double missed = 0.05;  // the fraction of intervals that may miss the rate
 
-/// How many independent bits would give a rate with the variance that the blocks show.
+/// The effective sample size: how many independent bits would give a rate with the variance that the blocks show.
 double effectiveBits(const ErrorCounts& errors, double blocks, double blockSize)
 {
     const double bits = blocks * blockSize;
     const auto wrong = static_cast<double>(errors.bitErrors);
     const double spread = static_cast<double>(errors.bitErrorSquares) - wrong * wrong / blocks;
     if (blocks < 2 || spread <= 0) {
-        return blocks;  // nothing is known of the variance: as if the bits of a block all failed or none
+        return blocks;  // variance unknown: as if all bits of a block failed or none
     }
     const double variance = spread / (blocks - 1) / (bits * blockSize);  // of the rate
     const double rate = wrong / bits;

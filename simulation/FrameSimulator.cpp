@@ -1,4 +1,4 @@
-// FrameSimulator: one thread's way from frame numbers to wrong bits: frames are made, decoded and compared.
+// FrameSimulator: makes and decodes frames and counts their wrong bits, in one thread.
 #include "FrameSimulator.h"
 
 #include <algorithm>
@@ -13,15 +13,15 @@ namespace morvik::simulation {
 
 namespace {
 
-/// Frames to decode at a time: the soft values and bits of as many stay in the second level of the cache, and at
-/// least as many as the encoder and the decoder take at once.
+/// Frames to decode at once: few enough that their soft values and bits stay in the L2 cache, and at least as many as
+/// the encoder and the decoder take at once.
 std::uint32_t framesAtOnce(unsigned blockSize)
 {
     return std::max(1024 / blockSize, 1U) * 64;
 }
 
-/// How many of the bits, each a byte of 0 or 1, are different. Block sizes are multiples of 8: words of eight bits are
-/// added byte by byte, and no byte and no sum of eight leaves its range within 31 words.
+/// Counts the bits that differ, each a byte of 0 or 1. Block sizes are multiples of 8: words of eight bytes are added,
+/// at most 31 of them, so that neither a byte nor the sum of all eight overflows.
 std::uint32_t differences(const std::uint8_t* a, const std::uint8_t* b, unsigned bits)
 {
     constexpr unsigned longest = 31 * 8;

@@ -1,4 +1,4 @@
-// FrameSimulator: one thread's way from frame numbers to wrong bits: frames are made, decoded and compared.
+// FrameSimulator: makes and decodes frames and counts their wrong bits, in one thread.
 #ifndef MORVIK_SIMULATION_FRAMESIMULATOR_H
 #define MORVIK_SIMULATION_FRAMESIMULATOR_H
 
@@ -15,21 +15,21 @@
 
 namespace morvik::simulation {
 
-/// Makes the frames of a plan's points and decodes them. Belongs to one thread.
+/// Simulates the frames of a plan's points. Belongs to one thread.
 class FrameSimulator {
 public:
-    /// The plan outlives the simulator. An empty instruction set leaves the choice to the decoder, which gives the
-    /// same bits with each.
+    /// `plan` must outlive the simulator. An empty instruction set leaves the choice to the decoder; all give the same
+    /// bits.
     FrameSimulator(const Plan& plan, std::string instructionSet);
 
     /// An empty result for the batch.
     BatchResult begin(const FrameBatch& batch) const;
 
-    /// Simulates the next frames of the batch, as many as are best decoded at a time, and adds them to the result;
-    /// false if there are none.
+    /// Simulates the next frames of the batch, as many as decode best at once, and adds them to the result. Returns
+    /// false if none are left.
     bool proceed(BatchResult& result);
 
-    /// The frames that were simulated last.
+    /// The frames simulated last.
     const morvik::link::Frames& frames() const;
 
 private:

@@ -1,5 +1,4 @@
-// Frames: ranges of frame numbers. A frame is one block of a run, and everything random about it follows from its
-// number.
+// Frames: ranges of frame numbers. A frame is one block of a run; its number determines everything random in it.
 #include "Frames.h"
 
 #include <algorithm>
@@ -11,7 +10,7 @@ namespace morvik::simulation {
 
 namespace {
 
-/// The ranges in ascending order, neighbours as one; nothing if some have a frame in common.
+/// Sorts the ranges and joins adjacent ones; nothing if any overlap.
 std::optional<std::vector<FrameRange>> joinedRanges(std::vector<FrameRange> all)
 {
     std::sort(all.begin(), all.end(), [](const FrameRange& a, const FrameRange& b) { return a.from < b.from; });

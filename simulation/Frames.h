@@ -1,5 +1,4 @@
-// Frames: ranges of frame numbers. A frame is one block of a run, and everything random about it follows from its
-// number.
+// Frames: ranges of frame numbers. A frame is one block of a run; its number determines everything random in it.
 #ifndef MORVIK_SIMULATION_FRAMES_H
 #define MORVIK_SIMULATION_FRAMES_H
 
@@ -11,7 +10,7 @@
 
 namespace morvik::simulation {
 
-/// The frames from `from` up to, but without, `to`.
+/// The half-open range of frames [from, to).
 struct FrameRange {
     std::uint64_t from = 0;
     std::uint64_t to = 0;
@@ -22,30 +21,30 @@ inline bool operator==(const FrameRange& a, const FrameRange& b)
     return a.from == b.from && a.to == b.to;
 }
 
-/// The range that the text FROM:TO writes; nothing if it is no such text or the range is empty or reversed.
+/// Parses FROM:TO. Returns nothing if the text is malformed or the range is empty or reversed.
 std::optional<FrameRange> parseFrameRange(std::string_view text);
 
-/// Any number of frames, as disjoint ranges in ascending order with gaps between them.
+/// A set of frames: disjoint ranges in ascending order with gaps between them.
 class FrameSet {
 public:
     FrameSet() = default;
     explicit FrameSet(FrameRange range);
 
-    /// Adds the frames of the other; refuses, and returns false, if both have some frame.
+    /// Adds the frames of another set. Returns false and adds none if the sets overlap.
     bool join(const FrameSet& other);
 
-    /// Whether a frame is among them.
+    /// Whether the set contains the frame.
     bool has(std::uint64_t frame) const;
 
-    /// How many frames there are.
+    /// The number of frames.
     std::uint64_t size() const;
 
     const std::vector<FrameRange>& ranges() const;
 
-    /// The ranges as FROM:TO, with a space between them.
+    /// The ranges as FROM:TO, separated by spaces.
     std::string text() const;
 
-    /// The frames that text() has written; nothing if it is no such text.
+    /// Parses the output of text(); nothing if it is malformed.
     static std::optional<FrameSet> parse(std::string_view text);
 
 private:

@@ -1,4 +1,4 @@
-// Journal: what a run has counted, kept in memory and on the disk.
+// Journal: the counts of a run, in memory and on disk.
 #include "Journal.h"
 
 #include <algorithm>
@@ -146,7 +146,7 @@ Checkpoint Journal::resumable(const std::string& checkpointFile) const
     return *checkpoint;
 }
 
-/// Forgets what an earlier run has counted of the points up to that one.
+/// Drops an earlier run's counts of the points up to `last`.
 void Journal::forgetBegun(std::size_t last)
 {
     auto& begun = itsCheckpoint.begun;

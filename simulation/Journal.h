@@ -1,4 +1,4 @@
-// Journal: what a run has counted, kept in memory and on the disk.
+// Journal: the counts of a run, in memory and on disk.
 #ifndef MORVIK_SIMULATION_JOURNAL_H
 #define MORVIK_SIMULATION_JOURNAL_H
 
@@ -13,38 +13,37 @@
 
 namespace morvik::simulation {
 
-/// Keeps the results of the ended points in a file, and beside it, until the run is complete, a checkpoint. Both are
-/// there as a whole whenever the process is killed, as they were saved last. All functions throw Error.
+/// Keeps the results of finished points in a file and, until the run is complete, a checkpoint beside it. Whenever the
+/// process is killed, both are whole, as last saved. All functions throw Error.
 class Journal {
 public:
-    /// What becomes of an earlier run: its checkpoint or its results are in the way, this run goes on from them, or
-    /// takes their place. A complete run has no checkpoint, but results; going on from there, nothing is left to do,
-    /// unless this run has larger limits.
+    /// What to do about an earlier run's checkpoint or results: refuse to start, resume from them, or overwrite them. A
+    /// complete run has results but no checkpoint; resuming it leaves nothing to do unless this run has larger limits.
     enum class Earlier { refuse, resume, overwrite };
 
-    /// Opens the journal, for no other run to open it, too, and finds out whether it can be kept. Without an output it
-    /// is kept in memory alone. The plan outlives the journal.
+    /// Opens the journal, locks it against other runs and checks that it can be written. Without an output it is kept
+    /// in memory only. `plan` must outlive the journal.
     Journal(const Plan& plan, std::string output, Earlier earlier);
 
-    /// Writes the files as they are at the beginning of a run.
+    /// Writes the initial files of a run.
     void begin();
 
     /// Whether nothing has been counted yet.
     bool isEmpty() const;
 
-    /// The points that have ended, in the order of the plan.
+    /// The finished points, in plan order.
     const std::vector<PointResult>& ended() const;
 
-    /// What has been counted at a point that has not ended, maybe nothing.
+    /// The counts so far of an unfinished point, possibly none.
     PointResult resultSoFar(std::size_t point) const;
 
-    /// Takes note of a point that has ended.
+    /// Records a finished point.
     void end(const PointResult& point);
 
-    /// Writes the files, with what has been counted at the running point, if one is.
+    /// Writes the files, with the counts so far of the running point, if any.
     void save(const std::optional<PointResult>& running);
 
-    /// The run is complete: writes the results, and the checkpoint goes.
+    /// Completes the run: writes the results and removes the checkpoint.
     void complete();
 
     /// The name of the checkpoint.
@@ -58,8 +57,8 @@ private:
     const Plan& itsPlan;
     std::string itsOutput;
     Checkpoint itsCheckpoint;
-    std::optional<base::OwnFile> itsFile;  // that the checkpoint is kept in
-    std::size_t itsResultsSaved = 0;       // how many points the results had when they were written last
+    std::optional<base::OwnFile> itsFile;  // holds the checkpoint
+    std::size_t itsResultsSaved = 0;       // points in the results when last written
 };
 
 }  // namespace morvik::simulation

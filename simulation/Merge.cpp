@@ -1,4 +1,4 @@
-// Merge: the results of several runs, joined.
+// Merge: joins the results of several runs.
 #include "Merge.h"
 
 #include <algorithm>
@@ -14,7 +14,7 @@ namespace morvik::simulation {
 
 namespace {
 
-/// A row of the joined results, and the file where its parameters were met first.
+/// A joined row, and the file in which its parameters first appeared.
 struct JoinedRow {
     ResultRow row;
     const std::string* file = nullptr;
@@ -83,14 +83,14 @@ void join(const Part& part, const ResultRow& row, JoinedRow& joined)
     }
 }
 
-/// The parameters of the point that a row belongs to: rows after different iterations of it share the number.
+/// The point of a row without its iterations: rows for different iterations share the point's number.
 Point withoutIterations(Point point)
 {
     point.iterations = 0;
     return point;
 }
 
-/// Whether each number still names one point, and no point has two of them.
+/// Whether points and numbers correspond one to one.
 bool areNumbersGood(const std::vector<Part>& parts)
 {
     std::map<Point, std::size_t> numbers;

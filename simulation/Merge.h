@@ -1,4 +1,4 @@
-// Merge: the results of several runs, joined.
+// Merge: joins the results of several runs.
 #ifndef MORVIK_SIMULATION_MERGE_H
 #define MORVIK_SIMULATION_MERGE_H
 
@@ -15,9 +15,9 @@ struct Part {
     Results results;
 };
 
-/// Joins results of disjoint frames: rows of the same parameters become one, with the counts of all of them. The
-/// order of the parts does not matter. Points keep their numbers where these are still good names, and get new ones
-/// otherwise. Throws Error when parts have frames in common, or differ in what all results of a run share.
+/// Joins results of disjoint frames: rows with the same parameters become one, with their counts added. The order of
+/// the parts does not matter. Points keep their numbers where these are unambiguous, and get new ones otherwise. Throws
+/// Error if parts have frames in common, or differ in what all results of a run share.
 Results merge(const std::vector<Part>& parts);
 
 }  // namespace morvik::simulation

@@ -1,4 +1,4 @@
-// MpiWorkers: the processes of an MPI job at work for a run of rank 0.
+// MpiWorkers: spreads the batches of rank 0 over the processes of an MPI job.
 #include "MpiWorkers.h"
 
 #include <algorithm>
@@ -14,11 +14,11 @@ namespace morvik::simulation {
 
 namespace {
 
-/// How long a rank waits for its threads before it looks for messages: little beside the time that a batch takes. MPI's
-/// own ways to wait would keep a core busy.
+/// How long a rank waits for its threads before it polls for messages: short compared with a batch. MPI's own ways to
+/// wait would keep a core busy.
 constexpr std::chrono::milliseconds pause(1);
 
-/// What two ranks have to agree about.
+/// What all ranks must agree on.
 std::string agreement(const Plan& plan)
 {
     return "version " + plan.version + ", " + plan.command;
@@ -48,7 +48,7 @@ public:
     }
 
 private:
-    /// Whatever goes wrong ends the work, but not the conversation.
+    /// Reports exceptions to rank 0. They end the work, but messages are still answered.
     template <class Action>
     void protect(Action action)
     {
@@ -96,7 +96,7 @@ private:
     const Plan* itsPlan;
     unsigned itsThreadCount;
     std::string itsInstructionSet;
-    std::unique_ptr<ThreadWorkers> itsThreads;  // from the beginning on, until something goes wrong
+    std::unique_ptr<ThreadWorkers> itsThreads;  // from the begin message until a failure
 };
 
 }  // namespace
@@ -180,7 +180,7 @@ bool dismissOthers(const MpiWorld& world, std::chrono::milliseconds patience)
     world.sendToOthers(MpiMessageKind::end);
     const auto end = std::chrono::steady_clock::now() + patience;
     int others = world.ranks() - 1;
-    // Results are still under way, and who sends one may wait until it is received.
+    // Results may still be in flight, and a sender may block until its message is received.
     while (others > 0 && std::chrono::steady_clock::now() < end) {
         const auto message = MpiWorld::receive();
         if (!message) {

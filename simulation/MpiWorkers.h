@@ -1,4 +1,4 @@
-// MpiWorkers: the processes of an MPI job at work for a run of rank 0.
+// MpiWorkers: spreads the batches of rank 0 over the processes of an MPI job.
 #ifndef MORVIK_SIMULATION_MPIWORKERS_H
 #define MORVIK_SIMULATION_MPIWORKERS_H
 
@@ -14,11 +14,11 @@
 
 namespace morvik::simulation {
 
-/// What rank 0 needs: threads of its own, which simulate, too, and all other ranks, which have as many each. The
-/// thread that calls it waits most of the time, and is the one that talks to the other ranks.
+/// The workers of rank 0: its own threads, and all other ranks with as many threads each. The calling thread mostly
+/// waits, and is the one that exchanges messages with the other ranks.
 class MpiWorkers : public Workers {
 public:
-    /// World and plan outlive the workers. For the instruction set, see FrameSimulator.
+    /// `world` and `plan` must outlive the workers. For the instruction set, see FrameSimulator.
     MpiWorkers(const MpiWorld& world, const Plan& plan, unsigned threads, const std::string& instructionSet);
 
     unsigned count() const override;
@@ -28,22 +28,22 @@ public:
 
 private:
     struct Rank {
-        unsigned batchesOut = 0;  // handed out, and not given back
-        unsigned forgetsOut = 0;  // told to forget, and not answered: the results until then are forgotten ones
+        unsigned batchesOut = 0;  // handed out, not yet returned
+        unsigned forgetsOut = 0;  // orders to forget, not yet answered: results until then are dropped
     };
 
     std::optional<BatchResult> takeFromOthers();
 
     const MpiWorld& itsWorld;
     ThreadWorkers itsThreads;
-    std::vector<Rank> itsRanks;  // the first one stands for the threads
+    std::vector<Rank> itsRanks;  // the first stands for this rank's threads
 };
 
-/// What all other ranks do: they work for rank 0, each in so many threads, until it dismisses them. Without a plan they
-/// only wait for that.
+/// Runs a rank other than 0: simulates for rank 0, in `threads` threads, until dismissed. Without a plan it only waits
+/// to be dismissed.
 void workForRankZero(const Plan* plan, unsigned threads, const std::string& instructionSet);
 
-/// Rank 0 ends the work of the others. Returns whether all of them have answered in time.
+/// Dismisses the other ranks, called by rank 0. Returns whether all have answered in time.
 bool dismissOthers(const MpiWorld& world, std::chrono::milliseconds patience);
 
 }  // namespace morvik::simulation

@@ -7,7 +7,7 @@
 
 namespace morvik::simulation {
 
-// What MPI's functions return needs no look: by default a failure in any of them ends the job.
+// Return codes of MPI are not checked: by default any failure ends the job.
 
 MpiWorld::MpiWorld()
 {

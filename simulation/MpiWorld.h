@@ -7,7 +7,7 @@
 
 namespace morvik::simulation {
 
-/// What is said between rank 0 and another.
+/// Messages between rank 0 and another rank.
 enum class MpiMessageKind : int {
     // from rank 0
     begin,   // batches of a plan will follow
@@ -16,19 +16,19 @@ enum class MpiMessageKind : int {
     end,     // leave
     // to rank 0
     result,     // of a batch
-    forgotten,  // an answer: no results of earlier batches follow
-    failure,    // why this rank gives no more results
-    ended       // an answer: nothing follows
+    forgotten,  // answers forget: no results of earlier batches follow
+    failure,    // why this rank returns no more results
+    ended       // answers end: nothing follows
 };
 
 struct MpiMessage {
-    int rank = 0;  // who sends it
+    int rank = 0;  // the sender
     MpiMessageKind kind = MpiMessageKind::end;
     std::string content;
 };
 
-/// This process in its job. One object in one thread; messages between two ranks come in the order in which they
-/// were sent.
+/// This process in its MPI job. Use one object, in one thread. Messages between two ranks arrive in the order in which
+/// they were sent.
 class MpiWorld {
 public:
     /// Joins the job.
@@ -49,10 +49,10 @@ public:
     /// Sends the same to all ranks but this one.
     void sendToOthers(MpiMessageKind kind, const std::string& content = {}) const;
 
-    /// The next message that has come, if one has. Does not wait.
+    /// The next message that has arrived, if any. Does not block.
     static std::optional<MpiMessage> receive();
 
-    /// This process will leave without waiting for the others, some of which may be dead.
+    /// Makes the destructor leave without waiting for the others, some of which may be dead.
     void abandon();
 
 private:

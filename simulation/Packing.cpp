@@ -1,4 +1,4 @@
-// Packing: batches and their results as bytes, the same on every machine.
+// Packing: serialises batches and their results, the same on every machine.
 #include "Packing.h"
 
 #include <algorithm>
@@ -10,7 +10,7 @@ namespace morvik::simulation {
 
 namespace {
 
-/// Appends a number in pieces of seven bits, the lowest first. The highest bit of a byte tells that more follow.
+/// Appends a variable-length number: seven bits per byte, lowest first; the top bit tells that more follow.
 void put(std::uint64_t number, std::string& bytes)
 {
     while (number >= 0x80) {
@@ -27,7 +27,7 @@ void putBatch(const FrameBatch& batch, std::string& bytes)
     put(batch.count, bytes);
 }
 
-/// Takes numbers from bytes.
+/// Reads packed numbers.
 class Reader {
 public:
     explicit Reader(std::string_view bytes) : itsBytes(bytes) {}
@@ -37,7 +37,7 @@ public:
         return itsBytes.empty();
     }
 
-    /// The next number, if it is at most `most`.
+    /// Reads the next number. Throws if it is above `most`.
     std::uint64_t get(std::uint64_t most = UINT64_MAX)
     {
         std::uint64_t number = 0;
@@ -93,7 +93,7 @@ std::string packed(const BatchResult& result)
     putBatch(result.batch, bytes);
     const std::size_t counts = result.clipped.empty() ? 0 : result.wrongBits.size() / result.clipped.size();
     put(counts, bytes);
-    std::size_t next = 0;  // the first frame that nothing has been told of
+    std::size_t next = 0;  // the first frame not yet packed
     for (std::size_t frame = 0; frame < result.clipped.size(); ++frame) {
         const std::uint32_t* const wrongBits = result.wrongBits.data() + frame * counts;
         const bool isQuiet = std::all_of(wrongBits, wrongBits + counts, [](std::uint32_t wrong) { return wrong == 0; });

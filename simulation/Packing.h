@@ -1,4 +1,4 @@
-// Packing: batches and their results as bytes, the same on every machine.
+// Packing: serialises batches and their results, the same on every machine.
 #ifndef MORVIK_SIMULATION_PACKING_H
 #define MORVIK_SIMULATION_PACKING_H
 
@@ -11,10 +11,10 @@ namespace morvik::simulation {
 
 std::string packed(const FrameBatch& batch);
 
-/// Frames without a wrong bit and without a clipped value take no room: most, where error rates are low.
+/// Frames without wrong bits or clipped values take no space: most of them, where error rates are low.
 std::string packed(const BatchResult& result);
 
-/// What was packed. Throws std::runtime_error if nothing is packed so.
+/// Inverses of packed(). Throw std::runtime_error if the bytes are malformed.
 FrameBatch unpackedBatch(std::string_view bytes);
 BatchResult unpackedResult(std::string_view bytes);
 

@@ -37,7 +37,7 @@ const std::vector<int>& milliDecibelsOf(const Sweep& sweep, const std::vector<in
     return sweep.milliDecibels.empty() ? usual : sweep.milliDecibels;
 }
 
-/// The rows of a point: its counts of iterations end at the point's own.
+/// Appends the rows of a point; its iteration counts end at the point's own.
 void appendRows(const Plan& plan, const PointResult& result, std::vector<ResultRow>& rows)
 {
     const Point& point = plan.points[result.number];
@@ -57,7 +57,7 @@ void appendRows(const Plan& plan, const PointResult& result, std::vector<ResultR
     }
 }
 
-/// The options of a command, with their values, if they have some.
+/// The options of a command, with their values, if any.
 std::map<std::string, std::string> optionsOf(const std::string& command)
 {
     std::map<std::string, std::string> options;
@@ -82,7 +82,7 @@ bool isNoLess(const std::string& now, const std::string& before)
     return limit && earlier && *limit >= *earlier;
 }
 
-/// Whether what an option has allowed before is allowed by the value that it has now, or by its absence.
+/// Whether an option's present value, or its absence, allows all that its earlier value allowed.
 bool isWithin(const std::string& option, const std::string& before, const std::optional<std::string>& now)
 {
     if (now == before) {

@@ -16,66 +16,65 @@
 
 namespace morvik::simulation {
 
-/// Values for each parameter, every combination of which is a point.
+/// Values of each parameter; every combination is a point.
 struct Sweep {
     std::vector<unsigned> blockSizes;
     std::vector<unsigned> numPus;
     std::vector<unsigned> algorithms;
     std::vector<ScaleOption> scaleOptions;
     std::vector<unsigned> iterations;
-    std::vector<int> milliDecibels;  // if empty, a range that suits the block size
+    std::vector<int> milliDecibels;  // if empty, a range suited to the block size
 };
 
-/// The Eb/N0 in which the error rates of blocks of K bits fall, in thousandths of a decibel.
+/// The Eb/N0 values over which the error rates of K-bit blocks fall, in thousandths of a decibel.
 std::vector<int> usualMilliDecibels(unsigned K);
 
-/// How many points a sweep has.
+/// The number of points of a sweep.
 std::uint64_t countOfPoints(const Sweep& sweep);
 
 /// The points in the order of results.
 std::vector<Point> pointsOf(const Sweep& sweep);
 
-/// All that the results of a run follow from.
+/// Everything that determines the results of a run.
 struct Plan {
     std::vector<Point> points;
-    bool eachIteration = false;  // looks at the decisions after each iteration, up to the point's
+    bool eachIteration = false;  // counts errors after each iteration, up to the point's
     StopRules rules;
     FrameRange frames = {0, UINT64_MAX};
     std::uint64_t seed = 0;
     std::string version;
-    std::string command;  // repeats the run; two plans are the same if their commands and versions are
+    std::string command;  // repeats the run; plans are equal if their commands and versions are
 
-    /// How many frames of a point can count at most.
+    /// The most frames of a point that may be counted.
     std::uint64_t mostFrames() const
     {
         return std::min(rules.maxBlocks.value_or(UINT64_MAX), frames.to - frames.from);
     }
 
-    /// How many counts of iterations are looked at in a point.
+    /// How many iteration counts a point has results for.
     std::size_t countsOf(const Point& point) const
     {
         return eachIteration ? point.iterations : 1;
     }
 };
 
-/// What keeps a run with the command `now` from going on with what one with the command `before` has counted, both as
-/// plans have them: "--seed 1 instead of 2, without --each-iteration". Empty if nothing does: the options are the same,
-/// or those that differ are limits of points, none of which is smaller than before.
+/// Why a run with the command `now` cannot resume one with the command `before`, both as plans have them: "--seed 1
+/// instead of 2, without --each-iteration". Empty if it can: the options are equal, or those that differ are limits of
+/// points, none smaller than before.
 std::string obstaclesBetween(const std::string& before, const std::string& now);
 
-/// What has been counted at a point of a plan.
+/// The counts of a point of a plan.
 struct PointResult {
     std::size_t number = 0;
     Tally tally;
     double seconds = 0;
 };
 
-/// Whether an earlier point of the curve has a block error rate below the one that ends curves. All earlier points are
-/// in the order of the plan.
+/// Whether an earlier point of the curve has a block error rate below the one that ends curves. `earlier` holds all
+/// earlier points, in plan order.
 bool isCurveEnded(const Plan& plan, std::size_t point, const std::vector<PointResult>& earlier);
 
-/// The first point behind the earlier ones that is simulated: whose curve has not ended. The number of points if none
-/// is.
+/// The first point after `earlier` whose curve has not ended; the number of points if there is none.
 std::size_t nextPoint(const Plan& plan, const std::vector<PointResult>& earlier);
 
 /// The rows of all points.

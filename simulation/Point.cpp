@@ -1,4 +1,4 @@
-// Point: what one error rate is simulated for.
+// Point: the parameters of one simulated error rate.
 #include "Point.h"
 
 #include <tuple>

@@ -1,4 +1,4 @@
-// PointCount: the counting of a point's frames in the order of their numbers, in whatever order their results come.
+// PointCount: counts a point's frames in the order of their numbers, whatever order results arrive in.
 #include "PointCount.h"
 
 #include <utility>

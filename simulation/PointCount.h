@@ -1,4 +1,4 @@
-// PointCount: the counting of a point's frames in the order of their numbers, in whatever order their results come.
+// PointCount: counts a point's frames in the order of their numbers, whatever order results arrive in.
 #ifndef MORVIK_SIMULATION_POINTCOUNT_H
 #define MORVIK_SIMULATION_POINTCOUNT_H
 
@@ -12,13 +12,14 @@
 
 namespace morvik::simulation {
 
-/// Counts frames until a rule ends the point or the frames do. Results of later frames wait for those before them.
+/// Counts frames until a stop rule ends the point or the frames run out. Results of later frames wait for those before
+/// them.
 class PointCount {
 public:
-    /// Goes on from a tally of the first frames of `frames`. The rules outlive the count.
+    /// Continues from a tally of the first frames of `frames`. `rules` must outlive the count.
     PointCount(const StopRules& rules, FrameRange frames, Tally tally);
 
-    /// Takes the result of a batch. Batches do not overlap.
+    /// Takes the result of a batch. Batches must not overlap.
     void take(BatchResult result);
 
     /// Whether the last frame that counts has been counted.
@@ -32,7 +33,7 @@ private:
     const StopRules& itsRules;
     FrameRange itsFrames;
     Tally itsTally;
-    std::map<std::uint64_t, BatchResult> itsWaiting;  // by their first frames
+    std::map<std::uint64_t, BatchResult> itsWaiting;  // by first frame
     bool itsIsComplete;
 };
 

@@ -1,4 +1,4 @@
-// Possible: whether numbers that were read from a file can have been counted.
+// Possible: plausibility checks of counts read from files.
 #include "Possible.h"
 
 #include <algorithm>
@@ -16,7 +16,7 @@ std::string cannotBe(const char* column, std::uint64_t number, const std::string
     return std::string(column) + ' ' + std::to_string(number) + " cannot be, of " + of;
 }
 
-/// Whether the frames are those that failed first, of so many.
+/// Whether these can be the first failing frames, of `blockErrors` in all.
 bool areFailures(const std::vector<std::uint64_t>& failures, const FrameSet& frames, std::uint64_t blockErrors)
 {
     return failures.size() == std::min<std::uint64_t>(blockErrors, ErrorCounts::keptFailures) &&
@@ -43,7 +43,7 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
     if (errors.bitErrors < errors.blockErrors || errors.bitErrors > errors.blockErrors * K) {
         return cannotBe("bit_errors", errors.bitErrors, wrongBlocks);
     }
-    // A square is odd where its number is, and so are the sums.
+    // A square is odd if its number is, so the two sums have the same parity.
     if (errors.bitErrorSquares < errors.bitErrors || errors.bitErrorSquares / K > errors.bitErrors ||
         errors.bitErrorSquares % 2 != errors.bitErrors % 2) {
         return cannotBe("bit_error_squares", errors.bitErrorSquares, std::to_string(errors.bitErrors) + " wrong bits");
@@ -60,7 +60,7 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
 
 bool isPossibleTime(double seconds)
 {
-    constexpr double longest = 1e12;  // even of several runs together
+    constexpr double longest = 1e12;  // even for several runs together
     return seconds >= 0 && seconds <= longest;
 }
 

@@ -1,4 +1,4 @@
-// Possible: whether numbers that were read from a file can have been counted.
+// Possible: plausibility checks of counts read from files.
 #ifndef MORVIK_SIMULATION_POSSIBLE_H
 #define MORVIK_SIMULATION_POSSIBLE_H
 
@@ -11,18 +11,17 @@
 
 namespace morvik::simulation {
 
-/// Years of work, and so few that rates and bounds can be computed: products with the bits of a block stay within 64
-/// bits.
+/// Years of work, yet small enough to compute rates and bounds: products with the bits of a block fit in 64 bits.
 constexpr std::uint64_t mostBlocks = std::uint64_t{1} << 48;
 
-/// Which of the numbers cannot be the errors, and the clipped soft values, of these frames of K bits, in words that
-/// begin with the name of its column; nothing if they can all be.
+/// Checks the errors and clipped soft values of these frames of K bits. Returns what is impossible, in words that begin
+/// with the column's name; nothing if all is possible.
 std::optional<std::string> impossibleCount(const FrameSet& frames,
                                            unsigned K,
                                            const ErrorCounts& errors,
                                            std::uint64_t clipped);
 
-/// Whether a run can have taken so long.
+/// Whether a run can take this long.
 bool isPossibleTime(double seconds);
 
 }  // namespace morvik::simulation

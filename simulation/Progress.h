@@ -1,4 +1,4 @@
-// Progress: whoever watches a run.
+// Progress: the observer of a run.
 #ifndef MORVIK_SIMULATION_PROGRESS_H
 #define MORVIK_SIMULATION_PROGRESS_H
 
@@ -6,7 +6,7 @@
 
 namespace morvik::simulation {
 
-/// Is told how a run goes on. Whatever it throws ends the run.
+/// Observes a run. An exception thrown here ends the run.
 class Progress {
 public:
     Progress() = default;
@@ -14,10 +14,10 @@ public:
     Progress& operator=(const Progress&) = delete;
     virtual ~Progress() = default;
 
-    /// What has been counted so far at the running point; several times a second.
+    /// Called several times a second with the counts so far of the running point.
     virtual void isAt(const PointResult& running) = 0;
 
-    /// A point has ended, in this run or before it was resumed.
+    /// Called for each finished point, including those finished before the run was resumed.
     virtual void hasEnded(const PointResult& point) = 0;
 };
 

@@ -1,4 +1,4 @@
-// Replay: one frame of a run once more, to be looked at.
+// Replay: reproduces one frame of a run for inspection.
 #include "Replay.h"
 
 #include "FrameSimulator.h"

@@ -1,4 +1,4 @@
-// Replay: one frame of a run once more, to be looked at.
+// Replay: reproduces one frame of a run for inspection.
 #ifndef MORVIK_SIMULATION_REPLAY_H
 #define MORVIK_SIMULATION_REPLAY_H
 
@@ -14,7 +14,7 @@ namespace morvik::simulation {
 struct ReplayedTexts {
     std::string softValues;
     std::string sentBits;
-    std::uint32_t wrongBits = 0;  // that the decoder of the point leaves
+    std::uint32_t wrongBits = 0;  // left by the decoder of the point
 };
 
 /// Makes the frame of the point and decodes it. For the instruction set, see FrameSimulator.

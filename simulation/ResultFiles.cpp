@@ -33,7 +33,7 @@ std::string headerLine()
     return line;
 }
 
-/// Puts the text into the row. Throws Error, which opens with `place`.
+/// Parses a field into the row. Throws Error, prefixed with `place`.
 void readField(const Column& column, const std::string& text, ResultRow& row, const std::string& place)
 {
     if (!column.read(text, row)) {

@@ -10,20 +10,20 @@ namespace morvik::simulation {
 
 enum class ResultFormat { csv, json };
 
-/// The format that the ending of the name asks for, .csv or .json. Throws Error for any other.
+/// The format of the file name's extension, .csv or .json. Throws Error for any other.
 ResultFormat formatOf(const std::string& fileName);
 
-/// The content of a file of results.
+/// Format results as the content of a file.
 std::string csvText(const Results& results);
 std::string jsonText(const Results& results);
 
-/// Writes a file of results, atomically, in the format that its name asks for. Throws Error.
+/// Writes results atomically, in the format of the file name's extension. Throws Error.
 void writeResults(const std::string& fileName, const Results& results);
 
-/// Reads a file of either format. Throws Error with the place of what is wrong.
+/// Reads a file of either format. Throws Error that says where the file is wrong.
 Results readResults(const std::string& fileName);
 
-/// Reads the content of such a file.
+/// Parses the content of such a file.
 Results parseResults(const std::string& text, const std::string& fileName);
 
 }  // namespace morvik::simulation

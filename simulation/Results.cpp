@@ -1,4 +1,4 @@
-// Results: rows of result files, one for each point, and for each count of iterations that was looked at there.
+// Results: rows of result files, one for each point and iteration count.
 #include "Results.h"
 
 #include "rules/Tail.h"

@@ -1,4 +1,4 @@
-// Results: rows of result files, one for each point, and for each count of iterations that was looked at there.
+// Results: rows of result files, one for each point and iteration count.
 #ifndef MORVIK_SIMULATION_RESULTS_H
 #define MORVIK_SIMULATION_RESULTS_H
 
@@ -26,7 +26,7 @@ struct ResultRow {
     std::string version;
 };
 
-/// What a result file holds. Rows are in the order of their points.
+/// The content of a result file. Rows are in the order of their points.
 struct Results {
     std::string version;  // of the program that wrote them
     std::string command;  // that repeats the run

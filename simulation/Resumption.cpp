@@ -1,4 +1,4 @@
-// Resumption: what a run can go on with of what an earlier one has counted.
+// Resumption: what a run can reuse of an earlier run's counts.
 #include "Resumption.h"
 
 #include <algorithm>
@@ -17,7 +17,7 @@ namespace {
 
 // ---- Whether a point has ended, or should have
 
-/// Whether nothing is left to be counted.
+/// Whether nothing is left to count.
 bool hasEnded(const Plan& plan, const PointResult& result)
 {
     constexpr double rounding = 0.0005;  // of times in result files
@@ -27,7 +27,7 @@ bool hasEnded(const Plan& plan, const PointResult& result)
     return isTimeUp || tally.blocks == plan.mostFrames() || isReached(plan.rules, tally.blocks, tally.errors.back());
 }
 
-/// Whether more has been counted than the plan would have.
+/// Whether more has been counted than the plan allows.
 bool isBeyond(const Plan& plan, const PointResult& result)
 {
     const StopRules& rules = plan.rules;
@@ -38,7 +38,7 @@ bool isBeyond(const Plan& plan, const PointResult& result)
             errors.bitErrors - *rules.bitErrors >= bitsOfLast);
 }
 
-/// Whether a limit of errors was met before the last frame.
+/// Whether an error limit was met before the last frame.
 bool wasMetBefore(const Plan& plan, const PointResult& result, FrameSimulator& simulator)
 {
     ErrorCounts errors = result.tally.errors.back();
@@ -66,9 +66,9 @@ bool wasMetBefore(const Plan& plan, const PointResult& result, FrameSimulator& s
                       " than the limits of this run allow; they may be larger than before, --overwrite starts anew");
 }
 
-// ---- What is taken on no trust
+// ---- Validation of checkpoints
 
-/// Throws Error unless the plan has the point, and its counts can be.
+/// Throws Error unless the plan has the point and its counts are possible.
 void checkPoint(const Plan& plan, const PointResult& result, const std::string& fileName)
 {
     const std::string place = fileName + ": point " + std::to_string(result.number);
@@ -98,7 +98,7 @@ void checkPoint(const Plan& plan, const PointResult& result, const std::string& 
     }
 }
 
-/// Throws Error unless the points are possible, and each is one that a run comes to.
+/// Throws Error unless the points are possible and a run reaches each of them.
 void checkOrder(const Plan& plan, const Checkpoint& checkpoint, const std::string& fileName)
 {
     std::vector<PointResult> earlier;
@@ -124,7 +124,7 @@ void checkOrder(const Plan& plan, const Checkpoint& checkpoint, const std::strin
     }
 }
 
-/// Parts the points where the first frame is missing.
+/// Splits the points at the first unfinished one.
 Standing parted(const Plan& plan, const std::vector<PointResult>& points)
 {
     Standing standing;
@@ -139,7 +139,7 @@ Standing parted(const Plan& plan, const std::vector<PointResult>& points)
 
 using Rows = std::map<Point, const ResultRow*>;
 
-/// What the rows tell of a point of the plan.
+/// Collects a point's result from the rows.
 PointResult resultOf(const Plan& plan, std::size_t number, const Rows& rows)
 {
     const Point& point = plan.points[number];
@@ -160,7 +160,7 @@ PointResult resultOf(const Plan& plan, std::size_t number, const Rows& rows)
     return result;
 }
 
-/// What the points ended with; nothing if the results are not those of a complete run of all points.
+/// The finished points; nothing unless the results are those of a complete run of all points.
 std::optional<std::vector<PointResult>> pointsOfComplete(const Plan& plan, const Results& results)
 {
     Rows rows;
@@ -171,14 +171,14 @@ std::optional<std::vector<PointResult>> pointsOfComplete(const Plan& plan, const
     for (std::size_t next = 0; next < plan.points.size(); next = nextPoint(plan, points)) {
         points.push_back(resultOf(plan, next, rows));
     }
-    // What the points were not made from, such as the seed or other rows, shows in the text.
+    // Comparing texts catches what the points do not hold, such as the seed or other rows.
     const bool isWhole =
         std::all_of(points.begin(), points.end(), [](const PointResult& point) { return point.tally.blocks > 0; }) &&
         csvText(resultsOf(plan, points)) == csvText(results);
     return isWhole ? std::optional(points) : std::nullopt;
 }
 
-/// What the command of a result file, if it has that of a run, tells against going on with it.
+/// Why the command of a result file, if it is that of a run, prevents resuming it.
 std::string obstacleIn(const std::string& command, const Plan& plan)
 {
     const bool isTold = command.rfind("morvik ber ", 0) == 0;

@@ -17,14 +17,13 @@ using Clock = std::chrono::steady_clock;
 
 constexpr std::chrono::milliseconds patience(100);
 
-/// Batches for each worker that are handed out at a time, so that it need not wait for the next.
+/// Batches handed out in advance for each worker, so that it need not wait.
 constexpr unsigned batchesAhead = 4;
 
-/// Batches for each worker by which the count of the frames may lag behind: what the results that wait for a slow
-/// worker's may take of the memory.
+/// Batches per worker by which counting may lag behind. Bounds the memory of results that wait for a slow worker's.
 constexpr unsigned batchesWaiting = 64;
 
-/// A batch takes some milliseconds: long beside what handing it out takes, short beside what people notice.
+/// A batch takes some milliseconds: long compared with handing it out, short compared with what people notice.
 std::uint32_t largestBatch(const Point& point)
 {
     constexpr unsigned bitIterations = 1U << 22;
@@ -36,7 +35,7 @@ double secondsSince(Clock::time_point start)
     return std::chrono::duration<double>(Clock::now() - start).count();
 }
 
-/// When the journal is saved.
+/// Saves the journal at intervals.
 class Saving {
 public:
     explicit Saving(const RunParts& parts) : itsJournal(parts.journal), itsInterval(parts.secondsBetweenCheckpoints) {}
@@ -55,7 +54,7 @@ private:
     Clock::time_point itsLast = Clock::now();
 };
 
-/// The simulation of one point.
+/// Simulates one point.
 class PointRun {
 public:
     PointRun(const Plan& plan, const RunParts& parts, Saving& saving, const PointResult& result)
@@ -83,7 +82,7 @@ public:
         return !isInterrupted;
     }
 
-    /// What has been counted.
+    /// The counts so far.
     const PointResult& result() const
     {
         return itsResult;
@@ -104,13 +103,13 @@ private:
         }
     }
 
-    /// Batches grow with the point: one that ends early shall not have many frames handed out for nothing.
+    /// Batches grow with the point, so that one that ends early wastes few frames.
     std::uint32_t batchSize() const
     {
         const std::uint64_t share =
             (itsNext - itsPlan.frames.from) / (std::uint64_t{2} * batchesAhead * itsParts.workers.count());
         const std::uint64_t size = std::clamp<std::uint64_t>(share, smallestBatch, itsLargestBatch);
-        const std::uint64_t unaligned = itsNext % smallestBatch;  // of a run that was resumed anywhere
+        const std::uint64_t unaligned = itsNext % smallestBatch;  // if resumed within a batch
         return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch - unaligned);
     }
 
@@ -144,8 +143,8 @@ private:
     PointResult itsResult;
     PointCount itsCount;
     std::uint32_t itsLargestBatch;
-    std::uint64_t itsNext;       // the first frame that has not been handed out
-    unsigned itsBatchesOut = 0;  // handed out, and not taken back
+    std::uint64_t itsNext;       // the first frame not yet handed out
+    unsigned itsBatchesOut = 0;  // handed out, not yet returned
     double itsSecondsBefore = itsResult.seconds;
     Clock::time_point itsStart = Clock::now();
 };

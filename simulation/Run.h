@@ -11,17 +11,17 @@
 
 namespace morvik::simulation {
 
-/// What a run is made with.
+/// The parts of a run.
 struct RunParts {
     Workers& workers;
     Journal& journal;
     Progress& progress;
-    std::function<bool()> isInterrupted;   // asked several times a second
-    double secondsBetweenCheckpoints = 3;  // at most that much work is lost in a crash
+    std::function<bool()> isInterrupted;   // polled several times a second
+    double secondsBetweenCheckpoints = 3;  // the most work that a crash can lose
 };
 
-/// Simulates the points of the plan that the journal does not have, and keeps them there. Returns whether the run is
-/// complete: false after an interruption, which leaves a checkpoint of all that has been counted.
+/// Simulates the points that the journal lacks, and records them there. Returns whether the run completed: false if
+/// interrupted, which leaves a checkpoint of all counts.
 bool run(const Plan& plan, const RunParts& parts);
 
 }  // namespace morvik::simulation

@@ -1,4 +1,4 @@
-// StopRules: when a point, and a curve, has been simulated for long enough.
+// StopRules: when to end a point and a curve.
 #include "StopRules.h"
 
 #include <algorithm>

@@ -1,4 +1,4 @@
-// Tally: what is counted at a point.
+// Tally: the counts of a point.
 #include "Tally.h"
 
 #include <algorithm>

@@ -1,4 +1,4 @@
-// Tally: what is counted at a point.
+// Tally: the counts of a point.
 #ifndef MORVIK_SIMULATION_TALLY_H
 #define MORVIK_SIMULATION_TALLY_H
 
@@ -8,31 +8,30 @@
 
 namespace morvik::simulation {
 
-/// The wrong decisions of any number of frames, at one count of iterations.
+/// The bit and block errors of any number of frames, at one iteration count.
 struct ErrorCounts {
-    /// How many failing frames are remembered.
+    /// The most failing frames that are recorded.
     static constexpr std::size_t keptFailures = 10;
 
     std::uint64_t bitErrors = 0;
     std::uint64_t blockErrors = 0;        // frames with a bit error
-    std::uint64_t bitErrorSquares = 0;    // sum of the squares of each frame's bit errors: how unevenly they fall
+    std::uint64_t bitErrorSquares = 0;    // sum of the squares of each frame's bit errors, for their variance
     std::vector<std::uint64_t> failures;  // numbers of the first failing frames, ascending
 
-    /// Counts a frame with that many wrong bits. Frames come in the order of their numbers.
+    /// Counts a frame with `wrongBits` wrong bits. Frames must come in the order of their numbers.
     void add(std::uint64_t frame, std::uint32_t wrongBits);
 
-    /// Counts what another has counted, of any other frames.
+    /// Adds the counts of other frames.
     void add(const ErrorCounts& other);
 };
 
-/// What is counted at a point.
+/// The counts of a point.
 struct Tally {
     std::uint64_t blocks = 0;
-    std::uint64_t clipped = 0;  // soft values that were clipped
-    std::vector<ErrorCounts>
-        errors;  // after each count of iterations that is looked at, the last one being the point's
+    std::uint64_t clipped = 0;        // clipped soft values
+    std::vector<ErrorCounts> errors;  // for each iteration count; the point's own is last
 
-    /// Nothing yet, with room for so many counts of iterations.
+    /// Starts empty, for `counts` iteration counts.
     explicit Tally(std::size_t counts = 1) : errors(counts) {}
 };
 

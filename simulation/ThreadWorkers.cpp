@@ -1,4 +1,4 @@
-// ThreadWorkers: the threads of this process at work for a run.
+// ThreadWorkers: simulates the batches of a run in threads of this process.
 #include "ThreadWorkers.h"
 
 #include <algorithm>

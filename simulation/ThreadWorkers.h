@@ -1,4 +1,4 @@
-// ThreadWorkers: the threads of this process at work for a run.
+// ThreadWorkers: simulates the batches of a run in threads of this process.
 #ifndef MORVIK_SIMULATION_THREADWORKERS_H
 #define MORVIK_SIMULATION_THREADWORKERS_H
 
@@ -17,10 +17,10 @@ namespace morvik::simulation {
 
 class FrameSimulator;
 
-/// Threads with a decoder state each.
+/// Threads, each with its own decoder state.
 class ThreadWorkers : public Workers {
 public:
-    /// Starts so many threads; throws Error if the system has none left. The plan outlives the workers. For the
+    /// Starts `threads` threads; throws Error if the system has none left. `plan` must outlive the workers. For the
     /// instruction set, see FrameSimulator.
     ThreadWorkers(const Plan& plan, unsigned threads, const std::string& instructionSet);
     ~ThreadWorkers() override;
@@ -35,13 +35,13 @@ private:
     void work(const Plan& plan, const std::string& instructionSet);
     void simulateUntilEnd(FrameSimulator& simulator);
 
-    std::mutex itsMutex;  // of all that follows
+    std::mutex itsMutex;  // guards all members below
     std::condition_variable itsHasBatch;
     std::condition_variable itsHasResult;
     std::deque<FrameBatch> itsBatches;
     std::deque<BatchResult> itsResults;
     std::exception_ptr itsFailure;
-    unsigned itsGeneration = 0;  // counts the times that everything was forgotten
+    unsigned itsGeneration = 0;  // increases whenever all batches are dropped
     bool itsIsEnding = false;
 
     std::vector<std::thread> itsThreads;

@@ -1,4 +1,4 @@
-// Workers: whoever simulates frames for a run.
+// Workers: the interface to what simulates the frames of a run.
 #ifndef MORVIK_SIMULATION_WORKERS_H
 #define MORVIK_SIMULATION_WORKERS_H
 
@@ -10,24 +10,24 @@
 
 namespace morvik::simulation {
 
-/// Neighbouring frames of a point of the plan.
+/// Consecutive frames of a point of the plan.
 struct FrameBatch {
     std::size_t point = 0;  // its number
     std::uint64_t first = 0;
     std::uint32_t count = 0;
 };
 
-/// Batches of a run have at least so many frames, if there are as many: what the encoder takes at a time.
+/// The fewest frames of a batch, if as many are left: what the encoder takes at once.
 constexpr std::uint32_t smallestBatch = 64;
 
-/// What came of a batch.
+/// The result of a batch.
 struct BatchResult {
     FrameBatch batch;
-    std::vector<std::uint32_t> wrongBits;  // of each frame, after each count of iterations that is looked at
-    std::vector<std::uint32_t> clipped;    // of each frame, how many soft values were clipped
+    std::vector<std::uint32_t> wrongBits;  // of each frame, for each iteration count
+    std::vector<std::uint32_t> clipped;    // clipped soft values of each frame
 };
 
-/// Takes batches and gives their results back, in any order. All workers know the plan.
+/// Simulates batches and returns their results, in any order. All workers know the plan.
 class Workers {
 public:
     Workers() = default;
@@ -35,16 +35,16 @@ public:
     Workers& operator=(const Workers&) = delete;
     virtual ~Workers() = default;
 
-    /// How many batches are worked on at the same time.
+    /// How many batches run in parallel.
     virtual unsigned count() const = 0;
 
-    /// Hands out a batch. Does not wait.
+    /// Hands out a batch. Does not block.
     virtual void handOut(const FrameBatch& batch) = 0;
 
-    /// The next result; nothing if none comes within the time. Throws what a worker has thrown.
+    /// Waits for the next result, at most `patience`; nothing if none comes. Rethrows a worker's exception.
     virtual std::optional<BatchResult> take(std::chrono::milliseconds patience) = 0;
 
-    /// Forgets all batches handed out so far: take() gives none of their results any more.
+    /// Drops all batches handed out so far: take() returns none of their results.
     virtual void forgetAll() = 0;
 };
 
