@@ -11,14 +11,14 @@ namespace morvik::comparison {
 
 namespace {
 
-/// A mistake, and what it is called.
+/// A mistake and its description.
 struct NamedMistake {
     Mistake mistake;
     const char* text;
     Candidate::Rank rank = Candidate::telling;
 };
 
-/// In the handing on of border columns. Masks are those of steps: rule 11 clears three bits of 12.
+/// Mistakes in handing on border columns. Masks are in steps: rule 11 clears three bits of 12.
 constexpr std::array<NamedMistake, 18> borderMistakes = {{
     {{Mistake::borderMask, -1}, "the seven low bits of border metrics are not cleared (rule 11)"},
     {{Mistake::borderMask, ~1}, "five low bits of border metrics are cleared, not seven (rule 11)"},
@@ -43,7 +43,7 @@ constexpr std::array<NamedMistake, 18> borderMistakes = {{
     {Mistake::tailClipped, "the tail's branch sums are clipped like branch metrics (rule 12: they are not)"},
 }};
 
-/// In the operations themselves.
+/// Mistakes in the operations themselves.
 constexpr std::array<NamedMistake, 34> namedMistakes = {{
     {Mistake::aprioriMissing, "the extrinsic values of the pass before do not arrive (rule 13)"},
     {Mistake::aprioriOfPassBefore, "a pass late: extrinsic values are those of the pass before the last (rule 13)"},
@@ -101,7 +101,7 @@ Fit fitIf(bool fits)
     return fits ? Fit::yes : Fit::no;
 }
 
-/// Columns that are asked for one value after the other.
+/// Columns under a mistake, queried value by value; keeps the last one.
 class Columns {
 public:
     Columns(const Replay& replay, Mistake mistake) : itsReplay(replay), itsMistake(mistake) {}
@@ -147,7 +147,7 @@ public:
         addOtherPlaces();
         addRounding(faults);
         addRelations();
-        constexpr std::size_t fewest = 8;  // with fewer, other bits may be alike by chance
+        constexpr std::size_t fewest = 8;  // with fewer, bits may look stuck by chance
         if (faults.size() >= fewest) {
             addStuckBits(bits);
         }
@@ -167,7 +167,7 @@ private:
         }
     }
 
-    /// A relation of what a dump has to what is wanted.
+    /// Adds a relation between the dump's values and the expected ones.
     template <class Relation>
     void addRelation(const std::string& text, Relation relation)
     {
@@ -176,7 +176,7 @@ private:
                                  }});
     }
 
-    /// Only what is kept of the metrics lacks bits: the recursion may go on with those that a dump does not have.
+    /// Covers metrics that are narrow only where stored: the recursion may use bits that the dump lacks.
     void addKeptIn(int bits)
     {
         const auto computed = std::make_shared<Columns>(itsReplay, Mistake(Mistake::computedIn, bits));
@@ -193,7 +193,7 @@ private:
     void addOtherPlaces()
     {
         const auto columns = std::make_shared<Columns>(itsReplay, Mistake());
-        // Before the first pass over a code, there are no extrinsic values, and all else is 0.
+        // Before the first pass over a code there are no extrinsic values, and all else is 0.
         const auto first = std::make_shared<Columns>(itsReplay, Mistake(Mistake::aprioriMissing));
         itsCandidates.push_back({"a pass late: values are those of the last pass over the same code",
                                  Candidate::descriptive,
@@ -212,7 +212,7 @@ private:
             itsCandidates.push_back(
                 {text, Candidate::descriptive, Candidate::place, [columns, distance, K](const Sample& sample) {
                      Place place = sample.place;
-                     place.step += static_cast<unsigned>(distance);  // above K below 0
+                     place.step += static_cast<unsigned>(distance);  // wraps to above K below 0
                      return place.step < K ? columns->fit(place, sample.got) : Fit::unknown;
                  }});
         };
@@ -220,10 +220,10 @@ private:
         addStep("values of the step after", 1);
     }
 
-    /// Another way to round changes all values that lose the same, by the same.
+    /// A different rounding changes all values that lose the same bits by the same amount.
     void addRounding(const std::vector<Fault>& faults)
     {
-        std::array<std::array<std::size_t, 3>, roundingClasses> counts{};  // of LSBs from -1 to 1
+        std::array<std::array<std::size_t, 3>, roundingClasses> counts{};  // of differences of -1 to 1 LSB
         for (const Fault& fault : faults) {
             const int difference = fault.got - fault.wanted;
             if (std::abs(difference) == 1) {
@@ -255,7 +255,7 @@ private:
     void addRelations()
     {
         addRelation("the sign is flipped", [](int got, int wanted) {
-            // The least value of 8 or 12 bits has no opposite.
+            // The smallest value of 8 or 12 bits has no negative.
             const bool stays = wanted == 0 || wanted == -128 || wanted == Values::smallest;
             return got == -wanted || got == ~wanted || (stays && got == wanted);
         });

@@ -13,20 +13,19 @@
 
 namespace morvik::comparison {
 
-/// Whether a value of the dump is what a mistake gives. It is not known where that follows from values that the dump
-/// lacks.
+/// Whether a value of the dump is what a mistake gives; unknown if that depends on values that the dump lacks.
 enum class Fit : std::uint8_t { no, yes, unknown };
 
-/// A value of the dump and what is wanted there: of right values both are the same.
+/// A value of the dump and the expected one; equal if the value is right.
 using Sample = Fault;
 
-/// A mistake that may explain faults. It has to give the wrong values as they are, and the right ones, too.
+/// A mistake that may explain faults. It must reproduce the wrong values and keep the right ones.
 struct Candidate {
-    /// Of those that fit as well, the least counts: what says how an operation goes wrong, what one of these includes,
-    /// what describes values.
+    /// Among equally good fits, the lowest rank wins: `telling` says how an operation goes wrong, `included` is covered
+    /// by one of these, `descriptive` only describes values.
     enum Rank : std::uint8_t { telling, included, descriptive };
-    /// Which values it would show in: those of the borders that are wrong, those of the whole operation, or, where the
-    /// mistake is known by its effect alone, those in the place that the faults have in common.
+    /// Where the mistake would show: in the wrong borders, in the whole operation or, if it is known by its effect
+    /// alone, in the place that the faults share.
     enum Reach : std::uint8_t { borders, operation, place };
 
     std::string text;
@@ -35,7 +34,7 @@ struct Candidate {
     std::function<Fit(const Sample&)> fits;
 };
 
-/// All candidates for the faults of a stage. What is given outlives them.
+/// All candidates for the faults of a stage. The arguments must outlive them.
 std::vector<Candidate> candidates(const Model& model, const Replay& replay, const std::vector<Fault>& faults);
 
 }  // namespace morvik::comparison

@@ -1,4 +1,4 @@
-// Comparison: where a dump leaves the model, and which values are wrong by themselves.
+// Comparison: where a dump departs from the model, and which values do not follow from their inputs.
 #include "Comparison.h"
 
 namespace morvik::comparison {

@@ -1,4 +1,4 @@
-// Coverage: how much a dump has of what the core computes.
+// Coverage: how many of the core's values a dump has.
 #include "Coverage.h"
 
 #include <algorithm>
@@ -54,7 +54,7 @@ std::uint64_t countOf(const Values& values)
     return count;
 }
 
-/// "2 to 15", "alpha0 to alpha7, llr": `inRow` tells whether a number goes on from the one before it.
+/// Lists numbers as "2 to 15", "alpha0 to alpha7, llr". `inRow` tells whether a number continues the range.
 template <class Name, class InRow>
 std::string listed(const std::vector<unsigned>& numbers, Name name, InRow inRow)
 {

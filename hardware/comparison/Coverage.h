@@ -1,4 +1,4 @@
-// Coverage: how much a dump has of what the core computes.
+// Coverage: how many of the core's values a dump has.
 #ifndef MORVIK_HARDWARE_COMPARISON_COVERAGE_H
 #define MORVIK_HARDWARE_COMPARISON_COVERAGE_H
 
@@ -13,17 +13,17 @@
 
 namespace morvik::comparison {
 
-/// A dump may lack signals. Of those that it has, it should have every value that the core computes.
+/// A dump may lack whole signals. Of those that it has, it should have every value that the core computes.
 struct Coverage {
-    std::uint64_t computed = 0;           ///< values of the core, whatever the dump has
-    std::vector<unsigned> absentSignals;  ///< places in passSignals, without those for which their twin stands
-    std::vector<unsigned> copiedSignals;  ///< these
+    std::uint64_t computed = 0;           ///< values of the core, in the dump or not
+    std::vector<unsigned> absentSignals;  ///< indices in passSignals, except those copied from their twin
+    std::vector<unsigned> copiedSignals;  ///< those copied from their twin
     std::vector<unsigned> absentPasses;   ///< half-iterations without any value
-    std::uint64_t gaps = 0;               ///< values that half-iterations and signals of the dump lack
+    std::uint64_t gaps = 0;               ///< values missing from the dump's half-iterations and signals
     std::optional<Place> firstGap;
     std::vector<unsigned> gapSignals;
 
-    /// The iterations that the dump has when it has all of these, and nothing of those behind them.
+    /// The number of iterations in the dump, if it has all their half-iterations and none after them.
     std::optional<unsigned> iterations;
 
     bool isComplete() const
@@ -34,7 +34,7 @@ struct Coverage {
 
 Coverage coverageOf(const Model& model, const Dump& dump);
 
-/// What is not in the dump, as "half-iterations 2 to 15".
+/// What the dump lacks, as "half-iterations 2 to 15".
 std::vector<std::string> lacksOf(const Coverage& coverage);
 
 }  // namespace morvik::comparison

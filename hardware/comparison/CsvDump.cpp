@@ -17,8 +17,8 @@ namespace {
 
 using base::shown;
 
-/// Whether a simulator writes a value of unknown bits so: as x, or with digits of x, z, u or w, "xxx", "0x7x", "zz01",
-/// "UUUU"; VHDL has - as well.
+/// Whether the text is a simulator's value of unknown bits: x, or digits with x, z, u or w among them ("xxx", "0x7x",
+/// "zz01", "UUUU"); VHDL has - as well.
 bool isUnknown(std::string_view text, NumberForm form)
 {
     text.remove_prefix(text.substr(0, 2) == "0x" && form != NumberForm::binary ? 2 : 0);
@@ -27,7 +27,7 @@ bool isUnknown(std::string_view text, NumberForm form)
     return any && !text.empty() && text.find_first_not_of("xXzZuUwW-0123456789abcdefABCDEF") == std::string_view::npos;
 }
 
-/// Reads rows of a value each, which name the signal, or rows with a column for each signal.
+/// Reads rows of one value that name the signal, or rows with a column for each signal.
 class CsvReader {
 public:
     CsvReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
@@ -132,7 +132,7 @@ private:
         }
     }
 
-    /// A row of unknown values may be one of before the simulation counts.
+    /// Before the simulation's outputs are valid, rows may have unknown values and no known place.
     bool namesItsPlace() const
     {
         return !isUnknown(itsRow.fields()[itsPass], NumberForm::integer) &&
@@ -163,11 +163,11 @@ private:
     base::CsvReader itsRow{itsFile};
     const NameMap& itsMap;
     Dump& itsDump;
-    std::set<std::string, std::less<>> itsLacking;  // of the names that the map needs
+    std::set<std::string, std::less<>> itsLacking;  // names that the map needs and the dump lacks
     std::size_t itsPass = 0;
     std::size_t itsStep = 0;
     std::size_t itsFields = 0;
-    std::optional<std::size_t> itsSignal;  // nothing when each signal has a column
+    std::optional<std::size_t> itsSignal;  // nothing if each signal has a column
     std::size_t itsValue = 0;
     std::vector<SignalColumn> itsColumns;
 };

@@ -1,5 +1,5 @@
-// Decisions: the trellis steps of rules/Trellis.h by each algorithm, and with the mistakes that hardware may have in
-// it.
+// Decisions: value types for the trellis steps of rules/Trellis.h, by each algorithm and with mistakes that hardware
+// may have.
 #ifndef MORVIK_HARDWARE_COMPARISON_DECISIONS_H
 #define MORVIK_HARDWARE_COMPARISON_DECISIONS_H
 
@@ -41,7 +41,7 @@ constexpr Held maxWrap(Held c1, Held c2)
     return c1.value < c2.value ? c2 : c1;
 }
 
-/// A value type and aligned words, there and back.
+/// Convert between a value type and aligned words.
 template <class Value>
 Value fromWord(std::int16_t word)
 {
@@ -59,7 +59,7 @@ constexpr std::int16_t wordOf(Held value)
 }
 
 /// The table of TCalculationEngineModBase::createLUT, called with a decision difference. Words of narrower registers
-/// are shifted up by the bits that those lack.
+/// are shifted up by the bits that they lack.
 template <class Value>
 struct Corrections {
     const unsigned char* middle;

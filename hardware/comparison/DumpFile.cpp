@@ -1,4 +1,4 @@
-// DumpFile: the lines of a dump, and what is wrong in them.
+// DumpFile: the lines of a dump, and errors in them.
 #include "DumpFile.h"
 
 #include "Dump.h"

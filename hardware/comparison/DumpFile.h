@@ -1,4 +1,4 @@
-// DumpFile: the lines of a dump, and what is wrong in them.
+// DumpFile: the lines of a dump, and errors in them.
 #ifndef MORVIK_HARDWARE_COMPARISON_DUMPFILE_H
 #define MORVIK_HARDWARE_COMPARISON_DUMPFILE_H
 
@@ -15,22 +15,22 @@ namespace morvik::comparison {
 
 class DumpFile : public base::LineReader {
 public:
-    /// `input` outlives the file; `name` is what messages call it.
+    /// `input` must outlive the file; `name` is its name in messages.
     DumpFile(std::istream& input, const std::string& name);
 
-    /// What is wrong with the dump as a whole.
+    /// Throws an error about the dump as a whole.
     [[noreturn]] void failAsAWhole(const std::string& what) const;
 
-    /// The names are those of signals in the map that the dump lacks: throws if there is one.
+    /// `names` are the map's signals that the dump lacks: throws unless it is empty.
     void expectNoneLacking(const std::set<std::string, std::less<>>& names, const NameMap& map) const;
 
-    /// Goes to the next line that has more than blanks; false at the end.
+    /// Advances to the next line that is not blank; false at the end.
     bool nextFilled();
 
-    /// A number that counts from `first`, brought to 0 to `count` - 1.
+    /// Parses a number that counts from `first`, and returns it as 0 to `count` - 1.
     unsigned count(const std::string& what, std::string_view text, unsigned first, unsigned count) const;
 
-    /// A value of the signal, as the map says it is written; the dump calls it `name`.
+    /// Parses a value of the signal in the form that the map gives; the dump calls the signal `name`.
     std::int16_t value(std::string_view name, unsigned signal, std::string_view text, const NameMap& map) const;
 };
 

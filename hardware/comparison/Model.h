@@ -14,12 +14,12 @@
 
 namespace morvik::comparison {
 
-/// The streams and permutations of the two constituent codes: 0 natural, 1 interleaved. Soft values are aligned words
-/// of the state format, K + 3 of them.
+/// The streams and permutation of a constituent code: 0 natural, 1 interleaved. K + 3 soft values each, as aligned
+/// words of the state format.
 struct Code {
     std::vector<short> systematic;
     std::vector<short> parity;
-    std::vector<unsigned> order;  ///< entry j is the place in the other code's order of what step j works on
+    std::vector<unsigned> order;  ///< entry j is the position of step j in the other code's order
 };
 
 /// Which of the two codes a half-iteration decodes.
@@ -30,23 +30,22 @@ constexpr unsigned codeOf(unsigned pass)
 
 struct Model {
     veltra_ip_morvik_v1_0_generics generics;
-    Values values;  ///< those that the core computes, and no others
+    Values values;  ///< only those that the core computes
     rules::Cut cut;
     std::array<Code, 2> codes;
 };
 
-/// Decodes the block; the library's warnings go to the stream. Throws Refusal when the library refuses.
+/// Decodes the block; the library's warnings go to `warnings`. Throws Refusal if the library refuses.
 Model computeModel(const SoftBlock& block,
                    const veltra_ip_morvik_v1_0_generics& generics,
                    unsigned iterations,
                    std::ostream& warnings);
 
-/// Whether all values of the dump are those that the core computes on the block. Values where it computes none do not
-/// count.
+/// Whether all values of the dump equal the core's on the block. Values that the core does not compute are ignored.
 bool computesAll(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& generics, const Values& dump);
 
-/// The steps of a stage in the order in which the core computes them: the segments at the same time, the backward
-/// recursion window by window from its end.
+/// The steps of a stage in the core's order of computation: segments in parallel, the backward recursion window by
+/// window from its end.
 std::vector<unsigned> stepsInOrder(const rules::Cut& cut, Stage stage);
 
 }  // namespace morvik::comparison

@@ -49,7 +49,7 @@ std::optional<std::int64_t> complement(std::optional<std::int64_t> digits, unsig
     return isNegative ? *digits - (std::int64_t{1} << bits) : *digits;
 }
 
-/// Reads the members of the object; each problem names the file.
+/// Reads the members of the object; errors name the file.
 class MapReader {
 public:
     MapReader(const Json& object, std::string name) : itsObject(object), itsName(std::move(name)) {}
@@ -227,7 +227,7 @@ std::optional<std::int64_t> NameMap::number(std::string_view text, unsigned sign
     const unsigned width = bits[signal];
     const bool isHexadecimal = text.substr(0, 2) == "0x" || text.substr(0, 2) == "0X";
     if (text.size() > 1 && text[0] == '+' && text[1] != '-') {
-        text.remove_prefix(1);  // which parseNumber() does not take
+        text.remove_prefix(1);  // parseNumber() rejects it
     }
     switch (numbers) {
     case NumberForm::integer:

@@ -16,20 +16,20 @@ namespace morvik::comparison {
 
 namespace {
 
-/// The part of the faults that a pattern has to explain: a fault may hide behind another.
+/// The fraction of the faults that a pattern must explain: one fault may hide another.
 constexpr double enough = 0.9;
 
-/// Fewer faults show a pattern by chance.
+/// Fewer faults may show a pattern by chance.
 constexpr std::size_t telling = 4;
 
-/// Of more faults than these, every nth is looked at.
+/// Larger sets of faults are sampled.
 constexpr std::size_t mostExplained = 20000;
 
 std::vector<Fault> sampleOf(const std::vector<Fault>& faults)
 {
     const std::size_t each = faults.size() / mostExplained + 1;
     std::vector<Fault> some;
-    // Not in equal strides: those may meet one signal or one segment alone.
+    // Not in equal strides: those may hit only one signal or one segment.
     std::minstd_rand random;
     for (std::size_t i = 0; i < faults.size(); i += each) {
         some.push_back(faults[i + random() % std::min(each, faults.size() - i)]);
@@ -37,7 +37,7 @@ std::vector<Fault> sampleOf(const std::vector<Fault>& faults)
     return some;
 }
 
-/// Looks for what gives the values of a stage, the wrong ones and the right ones alike.
+/// Looks for what explains all values of a stage, wrong and right alike.
 class Explainer {
 public:
     Explainer(const Model& model, const Values& dump, const Comparison& comparison)
@@ -63,7 +63,7 @@ public:
     }
 
 private:
-    /// Where the dump lacks inputs, the model's stand for them: a difference that follows from others is no fault.
+    /// Takes inputs that the dump lacks from the model: a difference that follows from others is no fault.
     std::vector<Fault> faultsOf(Stage stage)
     {
         std::vector<Fault> faults;
@@ -75,10 +75,11 @@ private:
                 }
             }
         }
-        return faults.empty() ? itsComparison.faults : faults;  // those of one stage, where none is left
+        return faults.empty() ? itsComparison.faults : faults;  // those of one stage, if none is left
     }
 
-    /// The tail gives the same values in each pass, of which one tells as much as all. Counts no further than needed.
+    /// Counts distinct faults, up to `telling`. The tail has the same values in each pass, so one pass says as much as
+    /// all.
     static std::size_t distinct(const std::vector<Fault>& faults)
     {
         std::set<std::array<int, 5>> all;
@@ -110,7 +111,7 @@ private:
         return {itsColumn.values[place.signal - signalsOf(stage).first], itsColumn.complete};
     }
 
-    /// The values of a stage that are right; those of one pass alone, where others cannot be told.
+    /// The right values of a stage; only those of the first differing pass if the dump lacks inputs.
     std::vector<Sample> rightValues(Stage stage)
     {
         const bool known = itsComparison.inputsAreKnown;
@@ -137,7 +138,7 @@ private:
         return (wanted.complete || !itsComparison.inputsAreKnown) && wanted.value == itsDump.at(place);
     }
 
-    /// The part of the faults that the candidate gives; 0 when it is less than enough.
+    /// The fraction of the faults that the candidate explains; 0 if below `enough`.
     static double explainedBy(const Candidate& candidate, const std::vector<Fault>& faults)
     {
         const double all = static_cast<double>(faults.size());
@@ -204,7 +205,7 @@ private:
         }
     }
 
-    /// What holds of the wrong values, but would not of right ones.
+    /// Describes what holds for the wrong values, but would not for right ones.
     static void describe(const std::vector<Fault>& faults, Finding& finding)
     {
         const auto consider = [&](const std::string& text, auto holds) {
@@ -237,8 +238,8 @@ private:
     Column itsColumn;
 };
 
-/// How many values of the dump are the model's, were its numbers other by these: of those that are the model's as they
-/// are, and of the others.
+/// How many values of the dump equal the model's once its numbers are shifted, of those that are right unshifted and of
+/// those that are wrong.
 struct Agreement {
     std::uint64_t right = 0;
     std::uint64_t rightEqual = 0;
@@ -271,7 +272,7 @@ bool isEnough(std::uint64_t part, std::uint64_t all)
     return static_cast<double>(part) >= enough * static_cast<double>(all);
 }
 
-/// Another way to count, and what tells of it.
+/// A shift of the dump's numbers, and its description.
 struct Shift {
     unsigned passes;
     unsigned steps;

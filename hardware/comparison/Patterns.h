@@ -12,23 +12,23 @@
 
 namespace morvik::comparison {
 
-/// What is found of the faults of one stage.
+/// What explains the faults of one stage.
 struct Finding {
     Stage stage;
     std::size_t faults = 0;
-    bool isByChance = false;  ///< so few, or so much alike, that what is found may be chance
+    bool isByChance = false;  ///< so few or so alike that the finding may be chance
     std::string where;        ///< "at the starts of windows alone"
-    /// The mistakes that give these values, all as many of them, and with which the right values are as they are.
+    /// The mistakes that explain these values equally well and keep the right ones right.
     std::vector<std::string> how;
-    std::string shared;    ///< "one LSB too high": what the wrong values have in common, where no mistake is found
-    double explained = 0;  ///< the part of the faults for which that holds
+    std::string shared;    ///< "one LSB too high": what the wrong values share, if no mistake is found
+    double explained = 0;  ///< the fraction of the faults that this explains
 };
 
-/// A finding for each stage that has faults, in the order in which they appear first.
+/// A finding for each stage that has faults, in order of first appearance.
 std::vector<Finding> findPatterns(const Model& model, const Values& dump, const Comparison& comparison);
 
-/// The dump counts passes or steps in another way: what to change. With it, most wrong values are right, and most right
-/// ones stay so. Several are found where they do that equally well.
+/// Detects a dump that numbers passes or steps differently, and returns what to change: most wrong values become right
+/// by it, and most right ones stay so. Several if they do that equally well.
 std::vector<std::string> findShifts(const Model& model, const Values& dump);
 
 }  // namespace morvik::comparison

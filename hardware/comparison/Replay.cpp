@@ -37,7 +37,7 @@ int clippedTo(int value, int bits)
     return rules::clip(value, -end, end - eighth);
 }
 
-/// A branch metric or extrinsic value as eight bits of an eighth each hold it (rules 5 and 14).
+/// A branch metric or extrinsic value as held in eight bits, in eighths (rules 5 and 14).
 int narrowed(int value, Mistake mistake)
 {
     switch (mistake.kind) {
@@ -54,13 +54,13 @@ int narrowed(int value, Mistake mistake)
     }
 }
 
-/// By how many bits words of narrower registers are shifted up, so that they wrap where those do.
+/// The bits by which words are shifted up so that they wrap like narrower registers.
 unsigned shiftOf(Mistake mistake)
 {
     return mistake == Mistake::computedIn ? static_cast<unsigned>(int{rules::stateBits} - mistake.number) : 0;
 }
 
-/// Calls use(rule, value) with the rule of decisions and a value of its kind.
+/// Calls use(rule, value) with the decision rule and a value of its type.
 template <class Use>
 auto withRule(int algorithm, Mistake mistake, const unsigned char* middle, Use use)
 {
@@ -222,8 +222,8 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
 
 Replay::TwiceIntrinsic Replay::twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const
 {
-    // A dump lacks the bit below an eighth. Hardware whose intrinsic value has other reasons than the inputs may have
-    // another one there than follows from them: then what is computed with it tells.
+    // A dump lacks the bit below an eighth. If the hardware's intrinsic value does not follow from the inputs, this bit
+    // may differ from theirs; values computed from it then decide.
     const int kept = input({pass, signalsOf(Stage::intrinsic).first, trellisStep}, complete);
     bool hasInputs = true;
     const int computed = twiceIntrinsicFromInputs(pass, trellisStep, {}, hasInputs);

@@ -12,14 +12,14 @@
 
 namespace morvik::comparison {
 
-/// A mistake in an operation, by which it gives other values than the core's.
+/// A mistake in an operation, which makes it give other values than the core's.
 struct Mistake {
     enum Kind : std::uint8_t {
         none,
         aprioriMissing,       ///< intrinsic values from the systematic ones alone
         aprioriOfPassBefore,  ///< extrinsic values of the pass before the last one
         aprioriUnpermuted,    ///< extrinsic values in the order of the other code
-        aprioriInverse,       ///< by the permutation that leads to the other code
+        aprioriInverse,       ///< by the inverse permutation
         aprioriBefore,        ///< by the interleaver's address for the step before
         aprioriBehind,
         systematicUnpermuted,  ///< systematic values in the natural order, on the interleaved code
@@ -34,17 +34,17 @@ struct Mistake {
         clippedTo,          ///< `number` bits
         clippedSymmetric,   ///< to -127 and 127
         wrappedTo,          ///< their low `number` bits
-        unwrapped,          ///< metrics and ratios held at the ends of their range
-        ratioHeld,          ///< the last difference of the ratio alone held there
-        storedIn,           ///< metrics and ratios cut to `number` bits once they are decided
+        unwrapped,          ///< metrics and ratios saturate
+        ratioHeld,          ///< only the last difference of the ratio saturates
+        storedIn,           ///< metrics and ratios cut to `number` bits once decided
         computedIn,         ///< in registers and adders of `number` bits
         borderMask,         ///< border columns ANDed with `number`, in steps
         borderUnknown,      ///< border columns of zeros
-        borderOfThisPass,   ///< where those of the last pass are right
-        borderOfLastPass,   ///< where those of this pass are right
+        borderOfThisPass,   ///< instead of the last pass's
+        borderOfLastPass,   ///< instead of this pass's
         borderOfOtherCode,  ///< of the pass before, over the other code
-        borderLate,         ///< those that were right in the last pass over the code
-        borderOfFirstPass,  ///< over the code, never renewed
+        borderLate,         ///< those for the last pass over the code
+        borderOfFirstPass,  ///< over the code, never updated
         tailClipped,        ///< the branch sums of the tail clipped like branch metrics
         unscaled,           ///< extrinsic values not multiplied by 0.75
         uncorrected,        ///< decisions without the correction table
@@ -67,24 +67,24 @@ struct Mistake {
     int number;
 };
 
-/// What an operation gives, in steps of the state metrics' format.
+/// The result of an operation, in steps of the state metrics' format.
 struct Column {
     std::array<std::int16_t, 8> values = {};  ///< of the stage's signals
     bool complete = true;                     ///< whether all inputs are in the dump
 };
 
-/// Takes the inputs of an operation from the dump, and from the model those that the dump lacks. So a value that
-/// merely follows from a wrong one is as expected here.
+/// Repeats operations on inputs from the dump, or from the model if the dump lacks them. A value that merely follows
+/// from a wrong one is thus as expected.
 class Replay {
 public:
-    /// Both outlive the replay.
+    /// Both must outlive the replay.
     Replay(const Model& model, const Values& dump);
 
     /// All signals of a stage at a trellis step.
     Column column(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake = {}) const;
 
-    /// What intrinsic and extrinsic values lose: equal for two values of a stage when every way to round treats them
-    /// alike, 0 where nothing is lost.
+    /// Classifies what intrinsic and extrinsic values lose in rounding: equal for two values of a stage if every
+    /// rounding treats them alike, 0 if nothing is lost.
     unsigned roundingClass(unsigned pass, Stage stage, unsigned trellisStep) const;
 
 private:
@@ -95,18 +95,19 @@ private:
     template <class Aligned>
     Aligned inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& complete) const;
 
-    /// The step of the pass before whose extrinsic value a step takes.
+    /// The step of the previous pass whose extrinsic value a step takes.
     unsigned aprioriStep(unsigned code, unsigned trellisStep, Mistake mistake) const;
     int twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const;
 
     struct TwiceIntrinsic {
         int value;
-        bool isSure;  ///< of the bit below a step, which a dump lacks: whether it follows from the dump's own values
+        bool isSure;  ///< whether the bit below a step, which dumps lack, follows from the dump's own values
     };
 
     TwiceIntrinsic twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const;
     bool isInDump(unsigned pass, Stage stage, unsigned trellisStep, const Column& column) const;
-    /// What `compute` makes of twice an intrinsic value; where that is not sure, what the dump has, if either makes it.
+    /// Applies `compute` to twice an intrinsic value. If that is not sure, tries both values and takes the one that
+    /// gives what the dump has, if either does.
     template <class Compute>
     Column fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisStep, Compute compute) const;
     bool givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const;
@@ -114,13 +115,13 @@ private:
     int wideExtrinsicValue(int ratio, int twice, Mistake mistake) const;
     int extrinsicValue(int ratio, int twice, Mistake mistake) const;
     Branches branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const;
-    /// The column to which a recursion comes from the step `from`. `hasEarlier` tells whether it came there from
-    /// another step, whose decisions may have left corrections pending.
+    /// The column that a recursion reaches from the step `from`. `hasEarlier` tells whether it came there from another
+    /// step, whose decisions may have left corrections pending.
     Metrics reached(unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, bool& complete) const;
     Metrics forwardStart(unsigned pass, unsigned segment, Mistake mistake, bool& complete) const;
     Metrics backwardStart(unsigned pass, const rules::Window& window, Mistake mistake, bool& complete) const;
     Metrics tail(unsigned pass, Mistake mistake) const;
-    /// The pass that leaves the column from which a segment or window starts; nothing where the state is unknown.
+    /// The pass whose column a segment or window starts from; nothing if the state is unknown.
     static std::optional<unsigned> borderPass(unsigned pass, bool ofThisPass, Mistake mistake);
 
     Column intrinsicColumn(unsigned pass, unsigned trellisStep, Mistake mistake) const;
@@ -132,7 +133,7 @@ private:
 
     const Model& itsModel;
     const Values& itsDump;
-    std::vector<unsigned char> itsCorrections;  // of each decision difference, from -32768
+    std::vector<unsigned char> itsCorrections;  // by decision difference, from -32768
 };
 
 }  // namespace morvik::comparison

@@ -14,7 +14,7 @@ namespace morvik::comparison {
 
 namespace {
 
-constexpr unsigned contextSteps = 3;  // before and behind the first difference
+constexpr unsigned contextSteps = 3;  // before and after the first difference
 
 __attribute__((format(printf, 1, 2))) std::string format(const char* form, ...)
 {
@@ -36,7 +36,7 @@ const char* codeName(unsigned pass)
     return codeOf(pass) == 0 ? "natural" : "interleaved";
 }
 
-/// What the values of a stage are, and the operation that gives them.
+/// The names of a stage's values and of the operation that gives them.
 struct StageWords {
     const char* values;
     const char* operation;
@@ -67,7 +67,7 @@ std::string shortName(Stage stage)
     return names[static_cast<std::size_t>(stage)];
 }
 
-/// What is found, or all that may be.
+/// The only text, or "either A, or B".
 std::string eitherOf(const std::vector<std::string>& texts)
 {
     std::string all = texts.size() > 1 ? "either " : "";
@@ -141,7 +141,7 @@ private:
         itsText += ".\n";
     }
 
-    /// Where the dump has the value, and in a waveform of what and when.
+    /// Adds the variable and time of a value, if the dump is a waveform.
     void addSource(const Place& place)
     {
         if (!itsDump.waveform) {
@@ -265,7 +265,7 @@ private:
         }
     }
 
-    /// The operation that gives a value, a start column among them.
+    /// The operation that gives a value, or where its start column comes from.
     std::string startText(const Place& place) const
     {
         const rules::Cut& cut = itsModel.cut;
@@ -363,7 +363,7 @@ private:
             return;
         }
         for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison)) {
-            if (itsCompared.otherRuns.empty() || !finding.how.empty()) {  // else it is explained
+            if (itsCompared.otherRuns.empty() || !finding.how.empty()) {  // otherwise explained already
                 addFinding(finding);
             }
         }

@@ -12,18 +12,18 @@
 
 namespace morvik::comparison {
 
-/// What a report is about. What it refers to outlives it.
+/// The input of a report. Everything referenced must outlive it.
 struct Compared {
     const Comparison& comparison;
     const Coverage& coverage;
     const Model& model;
     const Dump& dump;
-    std::string name;                    ///< what messages call the dump
-    bool isPartial;                      ///< the dump may lack values
-    std::vector<std::string> otherRuns;  ///< how the model computes the dump as it is, if it does
+    std::string name;                    ///< of the dump in messages
+    bool isPartial;                      ///< whether the dump may lack values
+    std::vector<std::string> otherRuns;  ///< changes with which the model computes exactly this dump
 };
 
-/// What is printed.
+/// Formats the report.
 std::string textOf(const Compared& compared);
 
 }  // namespace morvik::comparison

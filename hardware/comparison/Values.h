@@ -43,7 +43,7 @@ constexpr Stage stageOf(unsigned signal)
 }
 
 /// The branch metric that always equals this one, as the code has one parity bit for each data bit (rule 5): g3 is g0,
-/// and g2 is g1. Other signals have none and are returned.
+/// and g2 is g1. Other signals are returned unchanged.
 constexpr unsigned twinOf(unsigned signal)
 {
     const SignalRange branch = signalsOf(Stage::branch);
@@ -90,7 +90,7 @@ public:
         return itsValues[index(place)];
     }
 
-    /// Whether there is a value, and it is known.
+    /// Whether the value is present and known.
     bool has(const Place& place) const
     {
         return at(place) >= smallest;
@@ -106,7 +106,7 @@ public:
         itsValues[index(place)] = value;
     }
 
-    /// Has the values of the signal's twin stand for its own: they are inputs, and are not compared a second time.
+    /// Copies the values of the signal's twin: they serve as inputs, and are not compared again.
     void copyFromTwin(unsigned signal)
     {
         for (unsigned pass = 0; pass < itsPasses; ++pass) {

@@ -38,7 +38,7 @@ Digit digitOf(char character)
     return static_cast<Digit>(kind);
 }
 
-/// Multiples and unit of the dump's time, "10ps".
+/// The unit of the dump's times, "10ps".
 struct Timescale {
     std::uint64_t factor = 1;
     std::string unit;
@@ -74,10 +74,10 @@ public:
     }
 
 private:
-    /// More than a design has: a dump with more has no end.
+    /// More than any design has: guards against endless dumps.
     static constexpr unsigned mostNets = 1U << 23;
 
-    /// Words without a variable or a change of one, as of comments and of times at which nothing changes.
+    /// The most words in a row without a variable or a change, such as comments and times at which nothing changes.
     static constexpr unsigned mostIdle = 4000000;
 
     bool nextWord()
@@ -107,7 +107,7 @@ private:
         return std::string(itsWord);
     }
 
-    /// The words up to $end, without blanks between them; of those of a comment, some.
+    /// The words up to $end, without blanks between them; long texts such as comments are cut.
     std::string restOfCommand()
     {
         constexpr std::size_t longest = 65536;
@@ -123,7 +123,7 @@ private:
         }
     }
 
-    /// Has what is wrong told with its place.
+    /// Prefixes errors with the location.
     template <class Action>
     auto placed(Action action)
     try {
@@ -136,7 +136,7 @@ private:
     {
         const std::string command(itsWord);
         if (command == "$dumpvars" || command == "$dumpall" || command == "$dumpon" || command == "$end") {
-            return;  // the changes in it are read as others are
+            return;  // changes inside are read like any others
         }
         if (command == "$scope") {
             expectWord("the kind of a scope");
@@ -207,7 +207,7 @@ private:
         }
     }
 
-    /// Without the range of bits, and the mark of a name that is no identifier. An element, NAME[N], keeps its number.
+    /// The name without the bit range and the escape mark. An element, NAME[N], keeps its number.
     static std::string plainName(std::string name)
     {
         const std::size_t bracket = name.rfind('[');
@@ -218,7 +218,7 @@ private:
         return name;
     }
 
-    /// Chooses the variables that count, and finds out which scopes depend on them.
+    /// Chooses the variables to read, and finds the scopes that depend on them.
     void endDeclarations()
     {
         if (itsIsDeclared) {
@@ -273,7 +273,7 @@ private:
             digits = digits.substr(0, 1);
         } else if (kind == 's' || kind == 'S') {
             expectWord("the identifier of a variable");
-            return;  // a text
+            return;  // a string
         } else {
             itsFile.fail(shown(itsWord) + " is no change of a value");
         }
@@ -312,7 +312,7 @@ private:
         return inEighths ? *value : *value / 8;
     }
 
-    /// Leading digits that a dump leaves out are 0 (or, behind x and z, unknown as well).
+    /// Omitted leading digits are 0, or unknown if the first digit is x or z.
     std::optional<std::int64_t> bitsValue(const VcdVariable& variable, std::string_view digits) const
     {
         std::int64_t value = 0;
@@ -365,7 +365,7 @@ private:
         }
     }
 
-    /// The last known value of a place counts.
+    /// Keeps the last known value of a place.
     void keepValue(unsigned number, const Place& place)
     {
         const VcdVariable& variable = itsScopes.variables()[number];
@@ -409,8 +409,8 @@ private:
     std::uint64_t itsTime = 0;  // in the timescale's unit
     bool itsIsDeclared = false;
     std::map<std::string, unsigned, std::less<>> itsNets;  // by identifier
-    std::vector<std::vector<unsigned>> itsOfNet;           // variables that count
-    std::vector<std::vector<unsigned>> itsDependents;      // scopes whose values a variable changes
+    std::vector<std::vector<unsigned>> itsOfNet;           // variables to read
+    std::vector<std::vector<unsigned>> itsDependents;      // scopes that depend on a variable
     std::vector<unsigned> itsChanged;                      // scopes, since the last time
     std::vector<bool> itsHasChanged;
 };

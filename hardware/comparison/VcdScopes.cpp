@@ -1,4 +1,4 @@
-// VcdScopes: the scopes and variables of a value change dump, and which of them count.
+// VcdScopes: the scopes and variables of a value change dump, and the choice of those to read.
 #include "VcdScopes.h"
 
 #include <algorithm>
@@ -45,8 +45,8 @@ void VcdScopes::leave()
     itsScope = itsScopes[itsScope].parent;
 }
 
-/// Calls use(name, whether it has scopes) with the variable's name, the same behind the scope that it is in, behind the
-/// one around that, and so on, up to the longest that the map may have.
+/// Calls use(name, whether it has scopes) with the variable's name, then with the scope around it prefixed, the next
+/// scope, and so on, up to the longest name in the map.
 template <class Use>
 void VcdScopes::forEachName(const VcdVariable& variable, Use use) const
 {
@@ -61,7 +61,7 @@ void VcdScopes::forEachName(const VcdVariable& variable, Use use) const
     }
 }
 
-/// What the longest name that the map has says of the variable.
+/// Finds the signal by the longest name in the map that matches the variable.
 void VcdScopes::findSignal(VcdVariable& variable, bool& found)
 {
     std::optional<unsigned> signal;
@@ -126,7 +126,7 @@ bool VcdScopes::declare(VcdVariable variable)
     return true;
 }
 
-/// A scope comes behind those around it.
+/// Enclosing scopes come first in the list.
 void VcdScopes::inheritPlaces()
 {
     for (VcdScope& scope : itsScopes) {
@@ -165,7 +165,7 @@ void VcdScopes::chooseSignal(unsigned signal, std::vector<unsigned> candidates)
     }
 }
 
-/// A map that names variables of a signal with their scopes means these and no others.
+/// If the map names variables of a signal with their scopes, only those are meant.
 void VcdScopes::preferPaths(unsigned signal, std::vector<unsigned>& candidates)
 {
     const auto others = std::stable_partition(
@@ -178,8 +178,8 @@ void VcdScopes::preferPaths(unsigned signal, std::vector<unsigned>& candidates)
     candidates.erase(others, candidates.end());
 }
 
-/// A net that goes through several scopes is taken where most is known of what its values belong to, and but once where
-/// that is the same.
+/// Takes a net that passes through several scopes where most is known of its values' place, and only once where that is
+/// the same.
 void VcdScopes::joinNets(std::vector<unsigned>& candidates) const
 {
     const auto known = [this](unsigned variable) {
@@ -200,7 +200,7 @@ void VcdScopes::joinNets(std::vector<unsigned>& candidates) const
     candidates.erase(std::remove_if(candidates.begin(), candidates.end(), isNotNeeded), candidates.end());
 }
 
-/// Of two variables that are a signal, neither may be in a scope around the other's or belong to the same steps.
+/// Of two variables for one signal, neither may be in a scope around the other's or belong to the same steps.
 void VcdScopes::expectOneOfEachPlace(const std::vector<unsigned>& candidates) const
 {
     if (candidates.size() < 2) {

@@ -1,4 +1,4 @@
-// VcdScopes: the scopes and variables of a value change dump, and which of them count.
+// VcdScopes: the scopes and variables of a value change dump, and the choice of those to read.
 #ifndef MORVIK_HARDWARE_COMPARISON_VCDSCOPES_H
 #define MORVIK_HARDWARE_COMPARISON_VCDSCOPES_H
 
@@ -18,7 +18,7 @@ namespace morvik::comparison {
 
 constexpr unsigned nobody = ~0U;
 
-/// What a scope's values belong to, and whether they count.
+/// The role of a variable: it gives the place of its scope's values, marks them valid, or holds one.
 enum class Role : std::uint8_t { pass, step, valid, signal };
 
 struct VcdVariable {
@@ -30,10 +30,10 @@ struct VcdVariable {
     unsigned signal = 0;
     bool byPath = false;                ///< whether the map names it with scopes
     std::optional<std::int64_t> value;  ///< none while unknown
-    std::uint32_t line = 0;             ///< where it has changed
+    std::uint32_t line = 0;             ///< of its last change
 };
 
-/// The variables of a scope that count. Once all are declared, those of a scope around it stand for what it lacks.
+/// The variables to read in a scope. Once all are declared, it inherits those that it lacks from enclosing scopes.
 struct VcdScope {
     std::string name;
     unsigned parent = nobody;
@@ -43,24 +43,23 @@ struct VcdScope {
     std::vector<unsigned> signals;  // variables
 };
 
-/// Memory and time grow with the number of scopes and variables, and not with how deep they lie. What is wrong is
-/// thrown as a base::Error without a place.
+/// Collects scopes and variables, and chooses those to read. Memory and time grow with their number, not with the depth
+/// of nesting. Throws base::Error without a location.
 class VcdScopes {
 public:
-    /// More than a design has: a dump with more has no end.
+    /// More than any design has: guards against endless dumps.
     static constexpr unsigned mostScopes = 1U << 20;
 
     explicit VcdScopes(const NameMap& map);
 
-    /// A dump may come back to a scope that it has left.
+    /// A dump may re-enter a scope.
     void enter(const std::string& name);
     void leave();
 
-    /// Finds out what the variable is for; false when it does not count.
+    /// Finds the variable's role; false if it is not to be read.
     bool declare(VcdVariable variable);
 
-    /// All are declared: leaves those that count, and refuses two variables for one signal where none is to be
-    /// preferred.
+    /// Ends the declarations: keeps the variables to read, and refuses two for one signal if neither is preferred.
     void choose();
 
     const std::vector<VcdScope>& scopes() const
@@ -84,10 +83,10 @@ public:
         return itsLacking;
     }
 
-    /// "tb.dut.llr", as a terminal may get it; of very long ones, the end.
+    /// The path, "tb.dut.llr", escaped for terminals; only the end of very long ones.
     std::string pathOf(const VcdVariable& variable) const;
 
-    /// What the map has decided: "llr is tb.dut.llr, not tb.llr".
+    /// Choices made by the map: "llr is tb.dut.llr, not tb.llr".
     const std::vector<std::string>& notes() const
     {
         return itsNotes;
@@ -110,7 +109,7 @@ private:
 
     const NameMap& itsMap;
     std::set<std::string, std::less<>> itsLacking;
-    std::size_t itsLongestName = 0;  // that the map has
+    std::size_t itsLongestName = 0;  // in the map
     std::vector<VcdScope> itsScopes;
     std::map<std::pair<unsigned, std::string>, unsigned> itsScopeNumbers;  // by parent and name
     unsigned itsScope = nobody;
@@ -118,7 +117,7 @@ private:
     std::vector<std::string> itsNotes;
 };
 
-/// The error about two variables that are the same signal.
+/// Throws the error about two variables for the same signal.
 [[noreturn]] void failAboutTwo(const VcdScopes& scopes, const VcdVariable& one, const VcdVariable& other);
 
 }  // namespace morvik::comparison

@@ -29,7 +29,7 @@ bool startsInLastRow(const rules::Cut& cut, const Place& place)
     return cut.rows() > 1 && startsWindow(cut, place) && cut.windowAt(place.step).row + 1 == cut.rows();
 }
 
-/// The narrow ones first.
+/// Narrowest first.
 constexpr std::array<PlaceKind, 8> kinds = {{
     {"at the beginning of segment 0 alone",
      [](const rules::Cut& cut, const Place& place) {
@@ -56,7 +56,7 @@ constexpr std::array<PlaceKind, 8> kinds = {{
      }},
 }};
 
-/// What a property of all faults is, when it is one and the same.
+/// The property's value, if all faults share it.
 template <class Property>
 std::optional<unsigned> common(const std::vector<Fault>& faults, Property property)
 {
@@ -98,7 +98,7 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
     if (model.cut.unitsAtWork() < 2) {
         itsUnit.reset();
     }
-    constexpr std::size_t fewestSpread = 8;  // fewer faults are close to each other by chance
+    constexpr std::size_t fewestSpread = 8;  // fewer may be close together by chance
     itsHasRange = itsKind == nullptr && faults.size() >= fewestSpread && 2 * (itsLast - itsFirst + 1) <= stepsAround();
     const auto [first, count] = signalsOf(itsStage);
     const auto inDump = std::count_if(comparison.signals.begin() + first,
@@ -169,7 +169,7 @@ std::string Where::text() const
     return text;
 }
 
-/// Faults that are but the differences of the first pass tell nothing of passes.
+/// If the faults are only the differences of the first pass, they say nothing about passes.
 std::string Where::passText() const
 {
     if (itsIsOfOnePass || !itsCode) {

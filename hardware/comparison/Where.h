@@ -19,25 +19,25 @@ struct PlaceKind {
     bool (*matches)(const rules::Cut&, const Place&);
 };
 
-/// Places of one stage.
+/// A set of places of one stage.
 class Where {
 public:
-    /// The narrowest that all these faults of a stage are in. The model outlives it.
+    /// The narrowest set that contains all these faults of a stage. `model` must outlive it.
     Where(const Model& model, const Comparison& comparison, const std::vector<Fault>& faults);
 
-    /// "in segment 1 alone"; empty when the faults are spread.
+    /// "in segment 1 alone"; empty if the faults are spread.
     std::string text() const;
 
     bool contains(const Place& place) const;
 
-    /// Where a mistake in handing on border columns would show: in all states and steps alike. Of a single fault,
-    /// nothing tells where others might be.
+    /// Where a mistake in handing on border columns would show: in all states and steps alike. A single fault does not
+    /// tell where others might be.
     Where ofBorders() const;
 
     /// Where a mistake in an operation would show: at window edges and elsewhere alike.
     Where ofOperation() const;
 
-    /// The same in all passes and segments.
+    /// The same places in all passes and segments.
     Where spread() const;
 
 private:
@@ -57,7 +57,7 @@ private:
     std::optional<unsigned> itsUnit;
     unsigned itsFirst = 0;  ///< step
     unsigned itsLast = 0;
-    bool itsHasRange = false;  ///< whether the steps from first to last alone belong to it
+    bool itsHasRange = false;  ///< whether only the steps from first to last belong to it
     bool itsIsOnePlace = false;
 };
 
