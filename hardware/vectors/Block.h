@@ -1,4 +1,4 @@
-// Block: what goes into the core for one block, and what comes out of it.
+// Block: the core's input and output for one block.
 #ifndef MORVIK_HARDWARE_VECTORS_BLOCK_H
 #define MORVIK_HARDWARE_VECTORS_BLOCK_H
 
@@ -18,7 +18,7 @@ struct Stimulus {
     std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic and both parities, K + 4 values each
 };
 
-/// What the core computes at a trellis step of a half-iteration.
+/// The core's values at a trellis step of a half-iteration.
 struct InternalStep {
     std::uint32_t halfIteration = 0;
     std::uint32_t step = 0;                                 ///< from 0 to K + 2
@@ -28,8 +28,8 @@ struct InternalStep {
 struct Expected {
     std::uint32_t tag = 0;               ///< as the core carries it
     std::vector<std::uint8_t> bits;      ///< K decisions of 0 or 1
-    std::vector<std::int16_t> ratios;    ///< in eighths, -2048 to 2047; empty when not asked for
-    std::vector<InternalStep> internal;  ///< K + 3 trellis steps of each half-iteration; empty when not asked for
+    std::vector<std::int16_t> ratios;    ///< in eighths, -2048 to 2047; empty if not requested
+    std::vector<InternalStep> internal;  ///< K + 3 trellis steps of each half-iteration; empty if not requested
 };
 
 }  // namespace morvik::vectors

@@ -194,7 +194,7 @@ bool BlockReader::next(Stimulus& stimulus, Expected& expected)
     return true;
 }
 
-/// Goes to the next row of a table, which has to belong to the block.
+/// Advances to the next row of a table, which must belong to the block.
 bool BlockReader::nextRow(std::size_t table)
 {
     const tables::TableReader& reader = *itsReaders[table];
@@ -209,7 +209,7 @@ bool BlockReader::nextRow(std::size_t table)
     return true;
 }
 
-/// A column of the table of blocks has to tell where the block begins in another table.
+/// Checks that a column of the blocks table gives the block's first row in another table.
 void BlockReader::expectFirst(std::size_t column, std::size_t table) const
 {
     if (static_cast<std::uint64_t>(itsRow[column]) != itsRows[table]) {

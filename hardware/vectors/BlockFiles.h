@@ -20,29 +20,29 @@
 
 namespace morvik::vectors {
 
-/// A table as it is kept in a format, and how many rows it has.
+/// A stored table and its number of rows.
 struct KeptTable {
     tables::Table table;
     std::uint64_t rows = 0;
 };
 
-/// The tables of a set and where they are among all of them.
+/// The tables of a set, and the index of each.
 struct Layout {
     Layout(const tables::Format& format, const Settings& settings);
 
     std::vector<tables::Table> tables;
     bool streamsAreSeparate;  ///< the stimulus is three tables, one for each stream
     std::size_t blocks = 0;
-    std::size_t stimulus = 1;  ///< the first of them
+    std::size_t stimulus = 1;  ///< the first of its tables
     std::size_t expected = 0;
-    std::size_t ratios = 0;    ///< 0 when there are none
-    std::size_t internal = 0;  ///< 0 when there are none
+    std::size_t ratios = 0;    ///< 0 if there are none
+    std::size_t internal = 0;  ///< 0 if there are none
 };
 
 /// The files of all tables that a set can have.
 std::set<std::string> filesOfAllTables();
 
-/// Writes blocks one after the other.
+/// Writes blocks one by one.
 class BlockWriter {
 public:
     BlockWriter(const std::string& folder, const tables::Format& format, const Settings& settings);
@@ -50,7 +50,7 @@ public:
     void add(const Stimulus& stimulus, const Expected& expected);
     void finish();
 
-    /// What has been written.
+    /// The tables written so far.
     std::vector<KeptTable> tables() const;
 
 private:
@@ -64,15 +64,15 @@ private:
     std::uint32_t itsBlock = 0;
 };
 
-/// Reads them again. What is wrong is thrown as a base::Error that opens with the place.
+/// Reads blocks back. Throws base::Error, prefixed with the location.
 class BlockReader {
 public:
     BlockReader(const std::string& folder, const tables::Format& format, const Settings& settings);
 
-    /// Goes to the next block; false at the end, where no table may have rows left. Names are not in the tables.
+    /// Reads the next block; false at the end, where no table may have rows left. The tables do not hold names.
     bool next(Stimulus& stimulus, Expected& expected);
 
-    /// The rows that have been read of each table.
+    /// The rows read so far of each table.
     const std::vector<std::uint64_t>& rows() const
     {
         return itsRows;

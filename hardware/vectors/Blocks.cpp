@@ -20,7 +20,8 @@ constexpr std::int8_t lowest = -128;
 constexpr std::int8_t highest = 127;
 constexpr unsigned mostRows = 3;
 
-/// The frames of random bits are numbered on from size to size; those of directed blocks have numbers of their own.
+/// Frame numbers of random blocks continue from size to size; directed blocks have numbers of their own, from this one
+/// on.
 constexpr std::uint64_t firstDirectedFrame = std::uint64_t{1} << 32;
 
 /// A soft value by its stream, 0 to 2, its position, and whether that belongs to the tail.
@@ -75,7 +76,7 @@ constexpr NamedPattern patterns[] = {
      }},
 };
 
-/// Puts stimuli together and hands them on, with the tags 0, 1, 2 ... as the width carries them.
+/// Builds stimuli and hands them on, with tags 0, 1, 2 ... cut to the tag width.
 class Source {
 public:
     Source(const Settings& settings, const std::function<void(const Stimulus&)>& take)
@@ -94,7 +95,7 @@ public:
         itsTake(stimulus);
     }
 
-    /// A code word that is sent as well as it can be.
+    /// A noiseless code word at full amplitude.
     void takeSaturated(unsigned K, std::uint64_t frame)
     {
         Stimulus stimulus{"saturated_code_word", K, nextTag(), received(K, frame, noNoise).streams};

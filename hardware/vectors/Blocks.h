@@ -14,14 +14,14 @@ namespace morvik::vectors {
 /// The name of random blocks.
 constexpr char randomName[] = "random";
 
-/// Hands each stimulus on, one after the other: the random blocks of each size, then the directed ones.
+/// Calls `take` with each stimulus: the random blocks of each size, then the directed ones.
 void forEachStimulus(const Settings& settings, const std::function<void(const Stimulus&)>& take);
 
-/// The sizes at which the core with so many processing units cuts a block in another way than the size before, both of
-/// them, as long as a segment has up to three windows; and the smallest and the largest of all sizes.
+/// The sizes before and after each change in how a core with `units` processing units cuts blocks, for segments of up
+/// to three windows; and the smallest and the largest of all sizes.
 std::vector<unsigned> edgeSizes(unsigned units);
 
-/// The tags 0 and 1, the largest that the width carries, those just above, and all ones.
+/// The tags 0 and 1, the largest of `width` bits, those just above, and all ones.
 std::vector<std::uint32_t> edgeTags(unsigned width);
 
 }  // namespace morvik::vectors

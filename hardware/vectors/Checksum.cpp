@@ -24,7 +24,7 @@ std::string sha256(const std::string& fileName)
     }
     constexpr std::size_t digits = 64;
     std::string& line = outcome.out;
-    line.erase(0, line[0] == '\\' ? 1 : 0);  // marks a name with characters that are shown otherwise
+    line.erase(0, line[0] == '\\' ? 1 : 0);  // marks a file name with escaped characters
     return line.substr(0, digits);
 }
 

@@ -6,8 +6,8 @@
 
 namespace morvik::vectors {
 
-/// 64 hexadecimal digits, as sha256sum of the GNU core utilities finds them. Throws base::Error,
-/// also when it is no regular file.
+/// Returns 64 hexadecimal digits, computed by sha256sum of the GNU core utilities. Throws base::Error, also if it is no
+/// regular file.
 std::string sha256(const std::string& fileName);
 
 }  // namespace morvik::vectors

@@ -1,4 +1,4 @@
-// Core: the model as the source of what is expected.
+// Core: the model as the source of expected values.
 #include "Core.h"
 
 #include "rules/Formats.h"

@@ -1,4 +1,4 @@
-// Core: the model as the source of what is expected.
+// Core: the model as the source of expected values.
 #ifndef MORVIK_HARDWARE_VECTORS_CORE_H
 #define MORVIK_HARDWARE_VECTORS_CORE_H
 

@@ -1,4 +1,4 @@
-// Manifest: manifest.json, which tells all about a set of vectors.
+// Manifest: manifest.json, the description of a set of vectors.
 #include "Manifest.h"
 
 #include <algorithm>
@@ -59,7 +59,7 @@ Json formatOf(const ManifestFormat& format)
     return {{"name", format.name}, {"files", files}, {"tables", tables}};
 }
 
-/// The value of a member that is no larger than 32 bits hold.
+/// A member's value, at most 32 bits.
 std::uint32_t word(const base::JsonMembers& members, const char* name)
 {
     return static_cast<std::uint32_t>(members.integer(name, 0, UINT32_MAX));
@@ -90,7 +90,7 @@ int milliDecibelsFrom(const base::JsonMembers& json)
     return thousandths;
 }
 
-/// The settings of the set. Whatever the core refuses is left to it.
+/// The settings of the set. What the core checks itself is not checked here.
 Settings settingsOf(const base::JsonMembers& json)
 {
     Settings settings;
@@ -117,7 +117,7 @@ Settings settingsOf(const base::JsonMembers& json)
     return settings;
 }
 
-/// The tables of a format, which have to be those that it writes, but for their rows.
+/// The tables of a format, which must be those that it writes, apart from their rows.
 std::vector<KeptTable> tablesFrom(const base::Json& list,
                                   const std::string& place,
                                   const std::vector<tables::Table>& tables)
@@ -139,7 +139,7 @@ std::vector<KeptTable> tablesFrom(const base::Json& list,
     return found;
 }
 
-/// The format with its files, which have to be those that it writes with these settings.
+/// The format and its files, which must be those that it writes with these settings.
 ManifestFormat formatFrom(const base::Json& value, const Settings& settings, const std::string& fileName)
 {
     const base::JsonMembers json(value, fileName + ": format");

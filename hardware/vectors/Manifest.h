@@ -1,4 +1,4 @@
-// Manifest: manifest.json, which tells all about a set of vectors.
+// Manifest: manifest.json, the description of a set of vectors.
 #ifndef MORVIK_HARDWARE_VECTORS_MANIFEST_H
 #define MORVIK_HARDWARE_VECTORS_MANIFEST_H
 
@@ -23,7 +23,7 @@ struct ManifestFile {
     std::string sha256;
 };
 
-/// What a format keeps.
+/// The tables and files of a format.
 struct ManifestFormat {
     std::string name;
     std::vector<KeptTable> tables;
@@ -32,7 +32,7 @@ struct ManifestFormat {
 
 struct Manifest {
     std::string version;  ///< of morvik
-    std::string command;  ///< which makes the set again
+    std::string command;  ///< which reproduces the set
     Settings settings;
     std::vector<ManifestBlock> blocks;
     std::vector<ManifestFormat> formats;
@@ -42,12 +42,11 @@ constexpr char manifestName[] = "manifest.json";
 
 std::string manifestText(const Manifest& manifest);
 
-/// Reads what a set is checked by. Throws a base::Error that opens with the file when the text is no such
-/// manifest, has settings that cannot be, or names no block, no format, one twice, or other tables than the settings
-/// make.
+/// Parses a manifest. Throws base::Error, prefixed with the file's name, if the text is no manifest, has impossible
+/// settings, or names no block, no format, one twice, or other tables than the settings make.
 Manifest parseManifest(const std::string& text, const std::string& fileName);
 
-/// The same of a file.
+/// Parses a manifest file.
 Manifest readManifest(const std::string& fileName);
 
 }  // namespace morvik::vectors

@@ -1,4 +1,4 @@
-// Set: a folder of vectors, made and checked.
+// Set: makes and checks a folder of vectors.
 #include "Set.h"
 
 #include <algorithm>
@@ -65,7 +65,7 @@ std::optional<std::string> differenceOf(const std::vector<InternalStep>& got, co
     return std::nullopt;
 }
 
-/// The first difference between what the model gives and what a file says.
+/// The first difference between the model and a file.
 std::optional<std::string> differenceOf(const Expected& got, const Expected& wanted)
 {
     if (got.tag != wanted.tag) {
@@ -104,7 +104,7 @@ void expectRows(const std::string& folder, const ManifestFormat& format, const s
     }
 }
 
-/// The random blocks have to be of the sizes that the parameters tell, one size after the other.
+/// Checks that the random blocks have the sizes that the parameters give, one size after the other.
 void expectSizes(const std::string& folder, const Manifest& manifest)
 {
     std::size_t number = 0;
@@ -121,7 +121,7 @@ void expectSizes(const std::string& folder, const Manifest& manifest)
     }
 }
 
-/// The blocks have to be as many as the parameters tell.
+/// Checks that there are as many blocks as the parameters give.
 void expectBlocks(const std::string& folder, const Manifest& manifest)
 {
     const Settings& settings = manifest.settings;
@@ -142,7 +142,7 @@ void expectBlocks(const std::string& folder, const Manifest& manifest)
     expectSizes(folder, manifest);
 }
 
-/// The file of a table that the manifest does not name would be taken for one that was checked.
+/// Refuses files of tables that the manifest does not name: they would be taken for checked.
 void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
 {
     std::set<std::string> others = filesOfAllTables();
@@ -159,7 +159,7 @@ void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
     }
 }
 
-/// Checks one format; the first difference.
+/// Checks one format; returns the first difference.
 std::optional<std::string> checkFormat(const std::string& folder,
                                        const Manifest& manifest,
                                        const ManifestFormat& format,

@@ -1,4 +1,4 @@
-// Set: a folder of vectors, made and checked.
+// Set: makes and checks a folder of vectors.
 #ifndef MORVIK_HARDWARE_VECTORS_SET_H
 #define MORVIK_HARDWARE_VECTORS_SET_H
 
@@ -10,12 +10,12 @@
 
 namespace morvik::vectors {
 
-/// Makes a set in a folder that is not there, is empty, or holds an earlier set, which goes when the new one is
-/// complete. Other files stay. Throws base::Error. The manifest, whose settings, version and command are given,
-/// is written last, and returned.
+/// Makes a set in a folder that does not exist, is empty, or holds an earlier set, which is removed once the new one is
+/// complete. Other files stay. The manifest, given with settings, version and command, is written last and returned.
+/// Throws base::Error.
 Manifest makeSet(const std::string& folder, Manifest manifest);
 
-/// The values that were compared with the model's, over all formats.
+/// How many values were compared with the model's, over all formats.
 struct Compared {
     std::uint64_t tags = 0;
     std::uint64_t decisions = 0;
@@ -23,15 +23,15 @@ struct Compared {
     std::uint64_t internal = 0;
 };
 
-/// What the check of a set finds.
+/// The result of checking a set.
 struct CheckedSet {
     Manifest manifest;
     std::optional<std::string> difference;  ///< the first one, in words
     Compared compared;
 };
 
-/// Reads every format of a set and decodes its blocks again. Throws base::Error when a file is not as it was
-/// written, and when the set has less or more than its manifest tells.
+/// Reads every format of a set and decodes its blocks again. Throws base::Error if a file has changed since it was
+/// written, or if the set has less or more than its manifest says.
 CheckedSet checkSet(const std::string& folder);
 
 }  // namespace morvik::vectors

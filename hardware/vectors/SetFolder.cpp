@@ -1,4 +1,4 @@
-// SetFolder: the folder of a set of vectors, which gets a new set as a whole.
+// SetFolder: the folder of a set of vectors, which is replaced as a whole.
 #include "SetFolder.h"
 
 #include <fcntl.h>
@@ -23,15 +23,15 @@ namespace fs = std::filesystem;
 
 constexpr char asideName[] = ".morvik-unfinished";
 constexpr char lockName[] = "lock";
-constexpr char earlierName[] = "earlier";     // the folder for the set that is being replaced: there while files move
-constexpr char temporaryName[] = ".morvik-";  // how files begin that have not got their names
+constexpr char earlierName[] = "earlier";     // holds the set being replaced while files move
+constexpr char temporaryName[] = ".morvik-";  // prefix of files that do not have their final names yet
 
 std::string pathOf(const std::string& folder, const std::string& name)
 {
     return folder + '/' + name;
 }
 
-/// What has the name itself: links are not followed.
+/// The type of the entry itself: links are not followed.
 fs::file_type kindOf(const std::string& path)
 {
     std::error_code none;
@@ -48,7 +48,7 @@ bool isFolder(const std::string& path)
     return kindOf(path) == fs::file_type::directory;
 }
 
-/// A link may lead to somebody else's.
+/// Refuses links, which may lead to somebody else's folder.
 void expectOwnFolder(const std::string& path)
 {
     if (exists(path) && !isFolder(path)) {
@@ -93,7 +93,7 @@ std::vector<std::string> namesIn(const std::string& folder)
     return names;
 }
 
-/// The names of the files that a set has beside the manifest.
+/// The names of a set's files other than the manifest.
 std::vector<std::string> filesOf(const std::string& manifest)
 {
     std::vector<std::string> names;
@@ -105,7 +105,7 @@ std::vector<std::string> filesOf(const std::string& manifest)
     return names;
 }
 
-/// Throws if a folder has anything that is no file of a set, nor one of the others that it may have.
+/// Throws if a folder has anything but files of a set and `others`.
 void expectSetFiles(const std::string& folder, const std::set<std::string>& others)
 {
     std::set<std::string> known = filesOfAllTables();
@@ -132,7 +132,7 @@ SetFolder::Made::Made(std::string folder) : path(std::move(folder)), isOwn(false
 
 SetFolder::Made::~Made()
 {
-    std::error_code ignored;  // that something is in it
+    std::error_code ignored;  // if it is not empty
     if (isOwn) {
         fs::remove(path, ignored);
     }
@@ -159,7 +159,7 @@ SetFolder::~SetFolder()
             clearAside();
         }
     } catch (const base::Error&) {
-        return;  // the next one removes it
+        return;  // the next process removes it
     }
 }
 
@@ -197,7 +197,7 @@ void SetFolder::place()
     clearAside();
 }
 
-/// Goes on from wherever it was stopped.
+/// Continues from wherever it was stopped.
 void SetFolder::moveAll() const
 {
     const std::vector<std::string> newFiles = filesOf(made(manifestName));
@@ -219,7 +219,7 @@ void SetFolder::moveAll() const
     move(made(manifestName), placed(manifestName));
 }
 
-/// Undoes as much as has been moved.
+/// Undoes the moves made so far.
 void SetFolder::moveBack() const
 {
     for (const std::string& name : filesOf(made(manifestName))) {
@@ -236,7 +236,7 @@ void SetFolder::moveBack() const
     }
 }
 
-/// What a process has left that was killed: a complete set is placed.
+/// Cleans up after a killed process: a complete set is placed.
 void SetFolder::finishEarlier()
 {
     if (exists(made(manifestName))) {
@@ -245,7 +245,7 @@ void SetFolder::finishEarlier()
     clearAside();
 }
 
-/// The manifest goes first: what has one is complete.
+/// Removes the manifest first: a set that has one is complete.
 void SetFolder::clearAside() const
 {
     if (exists(made(manifestName))) {
@@ -281,7 +281,7 @@ void SetFolder::expectSetOrNothing() const
     }
 }
 
-/// Throws if a file that is no set's would be overwritten, or one cannot be moved.
+/// Throws if a file that is not part of a set would be overwritten, or one cannot be moved.
 void SetFolder::expectMovable() const
 {
     const std::vector<std::string> own = earlierFiles();
@@ -301,7 +301,7 @@ void SetFolder::expectMovable() const
     }
 }
 
-/// The files of the set that is being replaced, wherever it is by now.
+/// The files of the set being replaced, wherever they are by now.
 std::vector<std::string> SetFolder::earlierFiles() const
 {
     for (const std::string& manifest : {earlier(manifestName), placed(manifestName)}) {

@@ -1,4 +1,4 @@
-// SetFolder: the folder of a set of vectors, which gets a new set as a whole.
+// SetFolder: the folder of a set of vectors, which is replaced as a whole.
 #ifndef MORVIK_HARDWARE_VECTORS_SETFOLDER_H
 #define MORVIK_HARDWARE_VECTORS_SETFOLDER_H
 
@@ -9,32 +9,32 @@
 
 namespace morvik::vectors {
 
-/// Files that are not of a set stay as they are. Everything throws base::Error.
+/// Replaces the set in a folder. Files that are not part of a set stay. All functions throw base::Error.
 ///
-/// A new set is made aside, in a hidden folder within. When it is complete, the files of the earlier one go aside, too,
-/// and the new ones take their place. The manifest goes first and comes last: without it, there is no set. If a step
-/// fails, the earlier ones go back. A process that is killed leaves the earlier set or the new one, or, if that was
-/// while it moved the files, none: then the next one finishes it. What else a killed one has left is removed.
+/// A new set is made aside, in a hidden subfolder. When it is complete, the files of the earlier one move aside and the
+/// new ones take their place. The manifest leaves first and arrives last: without it, there is no set. If a step fails,
+/// the earlier files move back. A killed process leaves the earlier set or the new one or, if killed while it moved the
+/// files, none: the next process then finishes the move. Anything else left by a killed process is removed.
 class SetFolder {
 public:
-    /// Makes the folder if it is not there. Throws unless it is empty or holds an earlier set, and while another
-    /// process makes a set in it.
+    /// Makes the folder if needed. Throws unless it is empty or holds an earlier set, or while another process makes a
+    /// set in it.
     explicit SetFolder(std::string path);
     SetFolder(const SetFolder&) = delete;
     SetFolder& operator=(const SetFolder&) = delete;
 
-    /// What has not been placed goes.
+    /// Removes what has not been placed.
     ~SetFolder();
 
-    /// Where the files of the new set are to be made, the manifest last.
+    /// Where to make the files of the new set, the manifest last.
     const std::string& aside() const;
 
-    /// Puts the new set in the place of the earlier one. Throws, and leaves that, where something else has the name of
-    /// a file of either, or a file cannot be moved.
+    /// Replaces the earlier set by the new one. Throws, and keeps the earlier one, if something else has the name of a
+    /// file of either, or a file cannot be moved.
     void place();
 
 private:
-    /// A folder, made if it is not there. If it is this process's, it goes at the end when nothing is in it.
+    /// A folder, made if needed. If this process owns it, the destructor removes it if it is empty.
     struct Made {
         explicit Made(std::string folder);
         Made(const Made&) = delete;
@@ -54,7 +54,7 @@ private:
     void expectMovable() const;
     std::vector<std::string> earlierFiles() const;
 
-    /// The path of what is in the folder, aside, or aside as a file of the earlier set.
+    /// The path of a file in the folder, aside, or aside as part of the earlier set.
     std::string placed(const std::string& name) const;
     std::string made(const std::string& name) const;
     std::string earlier(const std::string& name) const;
@@ -64,7 +64,7 @@ private:
     base::OwnFile itsLock;
 };
 
-/// Throws where a killed process has left a set that is half placed.
+/// Throws if a killed process has left a set half placed.
 void expectPlaced(const std::string& folder);
 
 }  // namespace morvik::vectors

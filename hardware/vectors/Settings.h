@@ -18,7 +18,7 @@ struct Settings {
     unsigned blocks = 8;               ///< random ones of each size
     int milliDecibels = 1000;          ///< Eb/N0 of the random blocks, in thousandths of a decibel
     std::uint64_t seed = 1;
-    bool directed = true;  ///< whether there are directed blocks behind the random ones
+    bool directed = true;  ///< whether directed blocks follow the random ones
 
     std::vector<std::string> formats;
     unsigned width = 8;            ///< bits of a soft value in the files: 8 or 16
