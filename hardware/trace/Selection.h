@@ -11,8 +11,8 @@ namespace morvik::trace {
 struct Selection {
     std::uint32_t first = 0;  ///< half-iteration
     std::uint32_t last = 0;
-    std::vector<unsigned> signals;     ///< places in passSignals, ascending
-    std::vector<std::uint32_t> units;  ///< none for all
+    std::vector<unsigned> signals;     ///< indices in passSignals, ascending
+    std::vector<std::uint32_t> units;  ///< empty for all
 
     bool showsUnit(std::uint32_t unit) const
     {

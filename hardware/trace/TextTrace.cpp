@@ -26,7 +26,7 @@ std::optional<std::int64_t> beginningPass(std::string_view line)
     return std::nullopt;
 }
 
-/// Takes a trace as it is written, and lets through all lines but the tables of other half-iterations.
+/// Filters a trace as it is written, dropping the tables of other half-iterations.
 class PassFilter : public std::streambuf {
 public:
     PassFilter(const Selection& selection, base::OutputFile file)
@@ -34,7 +34,7 @@ public:
     {
     }
 
-    /// Throws what has gone wrong: the library does not let an exception pass.
+    /// Rethrows what went wrong: the library lets no exception pass.
     void finish()
     {
         if (itsFailure) {
@@ -94,7 +94,7 @@ private:
     std::int64_t itsFirst;
     std::int64_t itsLast;
     base::OutputFile itsFile;
-    std::string itsLine;  // as far as it has come
+    std::string itsLine;  // the current one, so far
     std::string itsDashes;
     bool itsShows = true;
     std::exception_ptr itsFailure;

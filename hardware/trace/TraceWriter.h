@@ -11,22 +11,22 @@
 
 namespace morvik::trace {
 
-/// What goes wrong is thrown as a base::Error that opens with the file. No writer keeps more than a pass.
+/// Writes passes as they are computed, and keeps at most one. Throws base::Error, prefixed with the file's name.
 class TraceWriter {
 public:
     virtual ~TraceWriter() = default;
 
-    /// `passes` has just computed the half-iteration.
+    /// Adds the half-iteration that `passes` has just computed.
     virtual void add(const Passes& passes, std::uint32_t halfIteration) = 0;
 
-    /// Writes the end. Nothing may be added behind it.
+    /// Writes the end. Nothing may be added after it.
     virtual void finish() = 0;
 };
 
-/// The table that table formats write: half-iteration, place and signals of a trellis step.
+/// The table that table formats write: half-iteration, place and signals of each trellis step.
 tables::Table traceTable(const Selection& selection);
 
-/// Rows of traceTable, all of them of the block.
+/// Writes the rows of traceTable(), all for `block`.
 std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<tables::TableWriter> table,
                                         std::uint32_t block,
                                         const Selection& selection);
@@ -34,7 +34,7 @@ std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<tables::TableWriter> tab
 /// Waveforms as a value change dump (IEEE 1364-2001, clause 18).
 std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const rules::Cut& cut, const Selection& selection);
 
-/// Writes the library's own trace of the selected half-iterations, with the input streams before them.
+/// Writes the library's own trace of the selected half-iterations, after the input streams.
 void writeText(const SoftBlock& block,
                const veltra_ip_morvik_v1_0_generics& generics,
                const Selection& selection,

@@ -8,7 +8,7 @@ namespace morvik::trace {
 
 namespace {
 
-/// A variable's number in the characters that identifiers consist of, all that print.
+/// A variable's number as an identifier, in all printable characters.
 std::string codeOf(std::size_t number)
 {
     constexpr std::size_t characters = '~' - '!' + 1;

@@ -13,8 +13,8 @@
 
 namespace morvik::trace {
 
-/// Declarations first, then times in ascending order, each with the values that change there. A value that is set again
-/// as it was takes no room.
+/// Writes declarations, then times in ascending order, each with the values that change. Setting a value to what it was
+/// writes nothing.
 class VcdFile {
 public:
     VcdFile(base::OutputFile file, const std::string& comment);
@@ -26,15 +26,15 @@ public:
     std::size_t addWire(const std::string& name, unsigned bits);
     std::size_t addReal(const std::string& name);
 
-    /// Ends the declarations: wires have unknown values, reals are 0.
+    /// Ends the declarations: wires start unknown, reals at 0.
     void endDeclarations(std::uint64_t time);
 
     void beginTime(std::uint64_t time);
 
-    /// The value of a wire in two's complement, unknown if there is none.
+    /// Sets a wire, in two's complement; nothing means unknown.
     void setWire(std::size_t variable, std::optional<std::int64_t> value);
 
-    /// The value of a real in eighths.
+    /// Sets a real, in eighths.
     void setReal(std::size_t variable, std::int64_t eighths);
 
     void finish();
@@ -52,7 +52,7 @@ private:
     void append(std::string_view text);
 
     base::OutputFile itsFile;
-    std::string itsPart;  // of the text, that is not written yet
+    std::string itsPart;  // text not yet written
     std::vector<Variable> itsVariables;
     std::uint64_t itsTime = 0;
     bool itsTimeIsWritten = false;

@@ -11,8 +11,8 @@ namespace morvik::trace {
 
 namespace {
 
-/// All segments go through their steps at the same time, as the hardware's threads do. A pass takes the steps of a
-/// segment, and those of the tail.
+/// All segments advance in parallel, as the hardware's threads do. A pass takes as many times as a segment and the tail
+/// have steps.
 class VcdTrace : public TraceWriter {
 public:
     VcdTrace(base::OutputFile file, const rules::Cut& cut, Selection selection)
@@ -91,8 +91,8 @@ private:
         itsFile.endScope();
     }
 
-    /// Behind the end of its segment, a thread has values in the tail alone. Reals, which cannot be unknown, stay
-    /// there.
+    /// After the end of its segment, a thread has values in the tail only. Reals cannot be unknown and keep their last
+    /// value.
     void setThread(const Passes& passes, const Thread& thread, std::uint32_t time)
     {
         const rules::Cut& cut = passes.cut();
