@@ -45,7 +45,7 @@ std::string declaration(const Table& table)
     return text;
 }
 
-/// The line behind which the rows begin.
+/// The line after which the rows begin.
 std::string beginning(const Table& table)
 {
     return declaration(table) + " = {";

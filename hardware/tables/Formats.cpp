@@ -1,4 +1,4 @@
-// Formats: how each of them writes and reads a table.
+// Formats: the file formats of tables.
 #include "Formats.h"
 
 #include "base/Error.h"
@@ -28,7 +28,7 @@ Storage storageOf(const Table& table)
         storage.isSigned = storage.isSigned || column.isSigned;
     }
     for (const Column& column : table.columns) {
-        // Beside values with a sign, others need a bit for it.
+        // In a signed integer, unsigned values need one bit more.
         const unsigned bits = column.bits + (storage.isSigned && !column.isSigned ? 1 : 0);
         while (storage.bits < bits) {
             storage.bits *= 2;

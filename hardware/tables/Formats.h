@@ -1,4 +1,4 @@
-// Formats: how each of them writes and reads a table.
+// Formats: the file formats of tables.
 #ifndef MORVIK_HARDWARE_TABLES_FORMATS_H
 #define MORVIK_HARDWARE_TABLES_FORMATS_H
 
@@ -19,11 +19,11 @@ extern const Format npyFormat;
 /// An array in C, with a header.
 extern const Format cFormat;
 
-/// Write a table to a file of any name. What csvWriter gets need not be a file that seeks.
+/// Write a table to a file of any name. The one for csvWriter need not be seekable.
 std::unique_ptr<TableWriter> csvWriter(base::OutputFile file, const Table& table);
 std::unique_ptr<TableWriter> npyWriter(base::OutputFile file, const Table& table);
 
-/// The bits of the machine's integer that holds any value of the table, and whether it has a sign.
+/// The machine integer that holds any value of the table.
 struct Storage {
     unsigned bits = 8;  ///< 8, 16 or 32
     bool isSigned = false;
@@ -31,10 +31,10 @@ struct Storage {
 
 Storage storageOf(const Table& table);
 
-/// Throws a base::Error about the place unless the column holds such values.
+/// Throws base::Error, prefixed with `place`, unless the value fits the column.
 void checkFits(std::int64_t value, const Column& column, const std::string& place);
 
-/// So for each value of the row that the reader has come to.
+/// The same for each value of the reader's current row.
 void checkFits(const Row& row, const Table& table, const TableReader& reader);
 
 }  // namespace morvik::tables

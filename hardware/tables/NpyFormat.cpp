@@ -20,7 +20,7 @@ std::string fileOf(const std::string& folder, const Table& table)
     return folder + '/' + table.name + ".npy";
 }
 
-/// The header of format version 1.0, padded with blanks to the size that it always has.
+/// The header of format version 1.0, padded with blanks to its fixed size.
 std::string header(const Table& table, std::uint64_t rows)
 {
     const Storage storage = storageOf(table);
@@ -133,7 +133,7 @@ private:
     std::ifstream itsFile;
     std::string itsPart;
     std::uint64_t itsRows = 0;
-    std::uint64_t itsRow = 0;  // how many have been read
+    std::uint64_t itsRow = 0;  // rows read
 };
 
 }  // namespace

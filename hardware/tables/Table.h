@@ -24,27 +24,27 @@ struct Table {
 
 using Row = std::vector<std::int64_t>;
 
-/// Writes the rows of a table to a file. What goes wrong is thrown as a base::Error that opens with the file.
+/// Writes the rows of a table to a file. Throws base::Error, prefixed with the file's name.
 class TableWriter {
 public:
     virtual ~TableWriter() = default;
 
-    /// `block` is the number of the block that the row belongs to. Each value has to fit into its column.
+    /// Adds a row of the block with number `block`. Each value must fit its column.
     virtual void add(std::uint32_t block, const Row& row) = 0;
 
-    /// Writes the end. Nothing may be added behind it.
+    /// Writes the end. Nothing may be added after it.
     virtual void finish() = 0;
 };
 
-/// Reads the rows of a table. What is wrong is thrown as a base::Error that opens with the place.
+/// Reads the rows of a table. Throws base::Error, prefixed with the location.
 class TableReader {
 public:
     virtual ~TableReader() = default;
 
-    /// Goes to the next row; false at the end.
+    /// Reads the next row; false at the end.
     virtual bool next(Row& row) = 0;
 
-    /// The block to which the row belongs, where the format tells.
+    /// The block of the row, if the format records it.
     virtual std::optional<std::int64_t> block() const
     {
         return std::nullopt;
@@ -54,11 +54,11 @@ public:
     virtual std::string place() const = 0;
 };
 
-/// A way to keep tables in files.
+/// A file format of tables.
 struct Format {
     std::string name;
 
-    /// The files that a table takes, without their folder.
+    /// The files of a table, without their folder.
     std::vector<std::string> (*files)(const Table& table);
 
     std::unique_ptr<TableWriter> (*writer)(const std::string& folder, const Table& table);
