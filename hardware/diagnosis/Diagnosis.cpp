@@ -12,19 +12,19 @@ namespace morvik::diagnosis {
 
 namespace {
 
-/// Evidence that a mistake needs, as a logarithm of odds: by itself, e^-12 is a chance in 160 000 for each of the 1728
-/// combinations; and together with blocks that decode once it is undone.
+/// Log odds that a mistake needs: by itself (e^-12 is a chance in 160 000 for each of the 1728 combinations), and
+/// together with blocks that decode once it is undone.
 constexpr double enoughByItself = 12;
 constexpr double enoughWithDecoding = 6;
-/// Standard deviations by which signs have to be better than chance to belong to the bits.
+/// Standard deviations by which signs must beat chance to be related to the bits.
 constexpr double related = 5;
 
-/// Blocks of which even fewer agree prove nothing where they decode: soft values of 0 decode into ones. Where a block
-/// of 40 bits just decodes, its signs are certain by some 6 standard deviations.
+/// With even fewer, decoding proves nothing: soft values of 0 decode into ones. Where a block of 40 bits just decodes,
+/// its signs beat chance by some 6 standard deviations.
 constexpr double meaningful = 3;
 constexpr std::size_t likelyAttempts = 8;
 constexpr std::uint32_t simulatedBlocks = 400;
-/// Of the simulated blocks: when fewer fail, noise does not explain a failure.
+/// If a smaller fraction of the simulated blocks fails, noise does not explain a failure.
 constexpr double explainedFrom = 0.005;
 
 std::vector<Case> undone(const std::vector<Case>& cases, const Mistakes& mistakes)
@@ -37,20 +37,20 @@ std::vector<Case> undone(const std::vector<Case>& cases, const Mistakes& mistake
     return right;
 }
 
-/// The logarithm of the odds that one wrong sign more is chance, where `fraction` of the signs are wrong anyway.
+/// The log odds that one more wrong sign is chance, if `fraction` of the signs are wrong anyway.
 double weightOf(const Signs& fewest)
 {
     const double fraction = std::clamp((fewest.wrong + 1) / (fewest.all + 2), 1e-4, 0.49);
     return std::log((1 - fraction) / fraction);
 }
 
-/// The odds of belonging to the bits, for numbers of values that differ: values beyond them count as chance.
+/// Log odds of belonging to the bits, comparable across numbers of values: values left out count as chance.
 double netOdds(const Suspicion& suspicion)
 {
     return suspicion.signs.odds() - enoughByItself * suspicion.mistakes.count();
 }
 
-/// A stream whose signs chance explains far better than what turns those of the others around.
+/// A stream whose signs chance explains far better than the error rate of the others.
 std::optional<std::size_t> strangerOf(const Appearance& appearance)
 {
     for (std::size_t stream = 0; stream < appearance.streams.size(); ++stream) {
@@ -97,7 +97,7 @@ public:
     }
 
 private:
-    /// The less the likelier.
+    /// The lower, the likelier.
     double cost(const Suspicion& suspicion, double eachMistake) const
     {
         return itsWeight * suspicion.signs.wrong + eachMistake * suspicion.mistakes.count();
@@ -142,7 +142,7 @@ private:
         }
     }
 
-    /// The likeliest attempt by the signs, or one that decodes more blocks and is backed by the signs as well.
+    /// The likeliest attempt by the signs, or one that decodes more blocks and that the signs support as well.
     Attempt choose(const std::vector<Attempt>& attempts) const
     {
         Attempt likeliest;
@@ -167,7 +167,7 @@ private:
         return best;
     }
 
-    /// A block that was padded at its end, as was its reference.
+    /// Tries blocks padded at the end, like their reference.
     void trySmallerSizes(Diagnosis& diagnosis)
     {
         const std::size_t K = itsCases.front().sent.size();
@@ -189,8 +189,7 @@ private:
         }
     }
 
-    /// A scale that is a power of two away from the one that suits. It is a mistake where it keeps blocks from
-    /// decoding.
+    /// Tries a scale that is off by a power of two. It is a mistake if it keeps blocks from decoding.
     void tryScale(Diagnosis& diagnosis)
     {
         const Appearance appearance = appearanceOf(undone(itsCases, diagnosis.best.mistakes));
@@ -245,7 +244,7 @@ private:
         }
     }
 
-    /// By amplitude and variance; the tail counts as in `morvik ber`.
+    /// Estimates the noise from amplitude and variance; the tail counts as in `morvik ber`.
     Noise noiseOf(const Diagnosis& diagnosis)
     {
         Noise noise;

@@ -13,7 +13,7 @@
 
 namespace morvik::diagnosis {
 
-/// What comes of the blocks once some mistakes are undone.
+/// The outcome for the blocks once some mistakes are undone.
 struct Attempt {
     Mistakes mistakes;
     Signs signs;
@@ -22,7 +22,7 @@ struct Attempt {
     std::uint64_t wrongBits = 0;
 };
 
-/// The noise in which the blocks were received, and what the decoder makes of such noise.
+/// The noise of the received blocks, and how the decoder fares in such noise.
 struct Noise {
     double ebn0 = 0;              ///< decibels
     std::size_t blockSize = 0;    ///< of the simulated blocks
@@ -34,28 +34,28 @@ enum class Verdict {
     healthy,      ///< all blocks decode as they are, and nothing looks mistaken
     mistaken,     ///< once the mistakes are undone all blocks decode
     careless,     ///< all blocks decode as they are, yet there are mistakes
-    strange,      ///< blocks fail, and one stream has nothing to do with the bits while the others have
-    noisy,        ///< blocks fail, once the mistakes (if any) are undone, as others do in this noise
+    strange,      ///< blocks fail, and one stream is unrelated to the bits while the others are related
+    noisy,        ///< blocks fail once the mistakes (if any) are undone, as others do in this noise
     unexplained,  ///< the same, but others do not fail in this noise
-    unrelated,    ///< the soft values have nothing to do with the bits, decoded or not
+    unrelated,    ///< the soft values are unrelated to the bits, decoded or not
 };
 
 struct Diagnosis {
     Verdict verdict = Verdict::healthy;
     std::size_t blocks = 0;
-    bool hasMore = false;                 ///< the file has blocks that were not looked at
+    bool hasMore = false;                 ///< the file has blocks that were not examined
     std::vector<Attempt> attempts;        ///< as the blocks are, then each mistake by itself and the most likely
                                           ///< combinations, the best first
     Attempt best;                         ///< with the mistakes that were found
     Appearance appearance;                ///< once they are undone
-    std::optional<std::size_t> stranger;  ///< the stream that has nothing to do with the bits
+    std::optional<std::size_t> stranger;  ///< the stream that is unrelated to the bits
     std::uint64_t clipped = 0;            ///< values of the file beyond -128 ... 127
     bool hasNegative = true;              ///< whether any value of the file is negative
     std::optional<Noise> noise;           ///< where blocks fail
 };
 
-/// Looks for the mistakes by which the cases can be explained. There is at least one case; bits are block sizes, and
-/// no case has fewer rows than bits.
+/// Looks for mistakes that explain the cases. There must be at least one case; the numbers of bits must be block sizes,
+/// and no case may have fewer rows than bits.
 Diagnosis diagnose(const std::vector<Case>& cases, const DecoderOptions& options);
 
 }  // namespace morvik::diagnosis

@@ -1,4 +1,4 @@
-// DiagnosisText: a diagnosis for people, and for programs.
+// DiagnosisText: a diagnosis as text and as JSON.
 #include "DiagnosisText.h"
 
 #include <algorithm>
@@ -29,7 +29,7 @@ std::string right(const std::string& text, std::size_t width)
     return std::string(width - std::min(width, text.size()), ' ') + text;
 }
 
-/// The mistakes with "and" between them.
+/// The mistakes, joined by "and".
 std::string listed(const Mistakes& mistakes)
 {
     std::string text;
@@ -55,7 +55,7 @@ bool isSame(const Mistakes& a, const Mistakes& b)
     return listed(a) == listed(b);
 }
 
-/// As it is, the best one, and the likeliest others that take no more mistakes.
+/// The attempt without changes, the best one, and the likeliest others with no more mistakes.
 std::string table(const Diagnosis& diagnosis)
 {
     std::string text =

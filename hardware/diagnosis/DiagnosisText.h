@@ -1,4 +1,4 @@
-// DiagnosisText: a diagnosis for people, and for programs.
+// DiagnosisText: a diagnosis as text and as JSON.
 #ifndef MORVIK_HARDWARE_DIAGNOSIS_DIAGNOSISTEXT_H
 #define MORVIK_HARDWARE_DIAGNOSIS_DIAGNOSISTEXT_H
 
@@ -8,10 +8,10 @@
 
 namespace morvik::diagnosis {
 
-/// What was tried, what was found, and what to change; lines.
+/// Lines that say what was tried, what was found, and what to change.
 std::string textOf(const Diagnosis& diagnosis);
 
-/// The same as a JSON object, with all that was tried; lines.
+/// The same as lines of a JSON object, with all attempts.
 std::string jsonOf(const Diagnosis& diagnosis);
 
 }  // namespace morvik::diagnosis

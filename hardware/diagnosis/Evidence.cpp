@@ -1,4 +1,4 @@
-// Evidence: how well soft values agree with the code word of the bits that were sent, for all mistakes at a time.
+// Evidence: how well soft values agree with the code word of the bits sent, for all mistakes at once.
 #include "Evidence.h"
 
 #include <algorithm>
@@ -21,8 +21,8 @@ int agreement(std::int32_t value, std::uint8_t bit)
     return bit != 0 ? sign : -sign;
 }
 
-/// Sums of agreements, from which those of any columns, signs and tail follow: what a value agrees with does not
-/// depend on the others.
+/// Sums of agreements, which give those of any columns, signs and tail, as each value's agreement is independent of the
+/// others.
 struct Agreements {
     std::array<std::array<long long, 3>, 3> data{};    ///< [column of the file][stream]
     std::array<std::array<long long, 12>, 12> tail{};  ///< [place of the file's tail][the standard's place]
@@ -49,7 +49,7 @@ struct Agreements {
         all += static_cast<long long>(3 * (K + tailRows));
     }
 
-    /// Of a column of the file, signs as they are.
+    /// The agreement of a column of the file, with signs as they are.
     long long of(std::size_t column, const Mistakes& mistakes) const
     {
         const std::size_t stream = columnContents[mistakes.columns][column];
@@ -70,7 +70,7 @@ struct Agreements {
     }
 };
 
-/// Appends all columns, signs and tails to the rows and the order.
+/// Appends all combinations of columns, signs and tails for the given rows and order.
 void append(const std::vector<Case>& cases, Mistakes mistakes, std::vector<Suspicion>& suspicions)
 {
     Agreements agreements;
@@ -89,7 +89,7 @@ void append(const std::vector<Case>& cases, Mistakes mistakes, std::vector<Suspi
     }
 }
 
-/// The ways in which the blocks may have come to their numbers of rows.
+/// The mistakes of rows that the blocks' numbers of rows allow.
 std::vector<Rows> rowsToTry(const std::vector<Case>& cases)
 {
     bool fewer = false;

@@ -1,8 +1,8 @@
-// Evidence: how well soft values agree with the code word of the bits that were sent, for all mistakes at a time.
+// Evidence: how well soft values agree with the code word of the bits sent, for all mistakes at once.
 //
-// The bits are encoded once more, and the signs of the soft values compared with what they should be. Noise turns a
-// part of them around, some 20 % where a block just decodes; a mistake makes half of those wrong that it touches. So
-// mistakes can be told apart with fewer blocks than decoding takes, and where noise is too strong for it.
+// The bits are encoded again, and the signs of the soft values compared with the expected ones. Noise flips some of
+// them, about 20 % where a block just decodes; a mistake makes half of the signs that it touches wrong. So mistakes can
+// be told apart with fewer blocks than decoding takes, and in noise too strong for it.
 #ifndef MORVIK_HARDWARE_DIAGNOSIS_EVIDENCE_H
 #define MORVIK_HARDWARE_DIAGNOSIS_EVIDENCE_H
 
@@ -25,34 +25,34 @@ struct Signs {
         return all > 0 ? wrong / all : 0;
     }
 
-    /// How many standard deviations fewer are wrong than chance makes them.
+    /// By how many standard deviations the number of wrong signs is below chance.
     double certainty() const;
 
-    /// The logarithm of the odds that they belong to the bits, against chance, where each is wrong with `probability`.
+    /// The log odds that the signs belong to the bits, against chance, if each is wrong with `probability`.
     double odds(double probability) const;
 
     /// The same for the probability that fits best.
     double odds() const;
 };
 
-/// Mistakes, and what is wrong with the signs once they are undone.
+/// Mistakes, and the signs once they are undone.
 struct Suspicion {
     Mistakes mistakes;
     Signs signs;
 };
 
-/// All combinations of mistakes but scale and smaller sizes. The blocks' bits have to be block sizes, and none may have
+/// All combinations of mistakes but scale and smaller sizes. Numbers of bits must be block sizes, and no block may have
 /// fewer rows than bits.
 std::vector<Suspicion> suspicions(const std::vector<Case>& cases);
 
-/// The same for all block sizes that are smaller than that of the blocks, all of one size; without mistakes of order.
+/// The same for all block sizes smaller than the blocks', without mistakes of order. All blocks must have one size.
 std::vector<Suspicion> suspicionsOfSmallerSizes(const std::vector<Case>& cases);
 
-/// What soft values look like beside their code word.
+/// Statistics of soft values against their code word.
 struct Appearance {
     std::array<Signs, 3> streams;  ///< of the data: systematic, first parity, second parity
     Signs tail;
-    double amplitude = 0;  ///< mean of the values, those of bits 0 being negated
+    double amplitude = 0;  ///< mean of the values, negated for bits 0
     double power = 0;      ///< mean of their squares
 
     Signs all() const;
@@ -61,7 +61,7 @@ struct Appearance {
     Signs others(std::size_t stream) const;
 };
 
-/// Of cases that are as they should be, but for the scale.
+/// The appearance of cases that are right but for the scale.
 Appearance appearanceOf(const std::vector<Case>& cases);
 
 /// The streams of a block's code word, tail included.

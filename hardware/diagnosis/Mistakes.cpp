@@ -1,4 +1,4 @@
-// Mistakes: what goes wrong on the way of soft values from an encoder to a file, and how it is undone.
+// Mistakes: what goes wrong with soft values between an encoder and a file, and how to undo it.
 #include "Mistakes.h"
 
 #include <algorithm>
@@ -19,7 +19,7 @@ std::array<Stream*, 3> streamsOf(SoftBlock& block)
     return {&block.rsc1Sys, &block.rsc1Par, &block.rsc2Par};
 }
 
-/// The streams' `size` rows from `first` on, zeros for those that are not there.
+/// `size` rows of the streams from `first` on, with zeros for missing ones.
 SoftBlock rowsOf(SoftBlock block, std::size_t first, std::size_t size)
 {
     for (Stream* stream : streamsOf(block)) {
@@ -29,7 +29,7 @@ SoftBlock rowsOf(SoftBlock block, std::size_t first, std::size_t size)
     return block;
 }
 
-/// Reverses the bits of each byte; what is left of a byte at the end is reversed by itself.
+/// Reverses the bits of each byte; a partial byte at the end is reversed by itself.
 void reverseBytes(std::vector<std::uint8_t>& bits)
 {
     for (std::size_t first = 0; first < bits.size(); first += 8) {

@@ -1,4 +1,4 @@
-// Mistakes: what goes wrong on the way of soft values from an encoder to a file, and how it is undone.
+// Mistakes: what goes wrong with soft values between an encoder and a file, and how to undo it.
 #ifndef MORVIK_HARDWARE_DIAGNOSIS_MISTAKES_H
 #define MORVIK_HARDWARE_DIAGNOSIS_MISTAKES_H
 
@@ -12,7 +12,7 @@
 
 namespace morvik::diagnosis {
 
-/// A block as a file has it, and the bits that are said to have been sent.
+/// A block of a file, and the bits said to have been sent.
 struct Case {
     SoftBlock received;
     std::vector<std::uint8_t> sent;  ///< each 0 or 1
@@ -58,7 +58,7 @@ constexpr std::array<std::array<std::uint8_t, 12>, 6> tailContents{{
     {6, 7, 8, 9, 10, 11, 0, 1, 2, 3, 4, 5},  // the second encoder first
 }};
 
-/// Mistakes that a file may have, all at a time. None as it is made.
+/// The mistakes of a file, all at once; none by default.
 struct Mistakes {
     Rows rows = Rows::right;
     std::size_t smallerSize = 0;  ///< K where rows are `smaller`
@@ -68,7 +68,7 @@ struct Mistakes {
     std::size_t tail = 0;     ///< of tailContents
     int doublings = 0;        ///< the values are 2^doublings times what they should be
 
-    /// How many there are.
+    /// The number of mistakes.
     unsigned count() const;
 };
 
@@ -79,14 +79,14 @@ struct Explanation {
     std::string change;  ///< what to do about it, as a sentence
 };
 
-/// Each of the mistakes.
+/// Explains each of the mistakes.
 std::vector<Explanation> explain(const Mistakes& mistakes);
 
-/// Takes the block's rows and bits out of the file's. Leaves blocks alone that have the right number of rows, unless
-/// `rows` is `smaller`.
+/// Extracts the block's rows and bits from the file's. Leaves blocks with the right number of rows alone, unless `rows`
+/// is `smaller`.
 Case cut(const Case& block, const Mistakes& mistakes);
 
-/// Undoes the order in a case that has been cut.
+/// Undoes the order in a case that has been cut().
 void restoreOrder(Case& block, Order order);
 
 /// The case as it should have been, K + 4 rows and K bits.

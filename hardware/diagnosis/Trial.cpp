@@ -1,4 +1,4 @@
-// Trial: decodes cases, and blocks in the same noise.
+// Trial: decodes cases, and simulated blocks in the same noise.
 #include "Trial.h"
 
 #include <algorithm>

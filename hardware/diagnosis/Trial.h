@@ -1,4 +1,4 @@
-// Trial: decodes cases, and blocks in the same noise.
+// Trial: decodes cases, and simulated blocks in the same noise.
 #ifndef MORVIK_HARDWARE_DIAGNOSIS_TRIAL_H
 #define MORVIK_HARDWARE_DIAGNOSIS_TRIAL_H
 
@@ -21,7 +21,7 @@ public:
     struct Result {
         std::size_t decoded = 0;  ///< blocks without a wrong bit
         std::uint64_t wrongBits = 0;
-        std::size_t failedSize = 0;  ///< bits of the first block that has a wrong one
+        std::size_t failedSize = 0;  ///< bits of the first block with a wrong one
     };
 
     /// Cases with K + 4 rows.
