@@ -12,7 +12,7 @@ namespace morvik {
 
 namespace {
 
-/// Holds the process's two output streams redirected for as long as it lives.
+/// Redirects the process's two output streams during its lifetime.
 class Redirection {
 public:
     explicit Redirection(std::ostream& messages)
@@ -26,7 +26,7 @@ public:
     ~Redirection()
     {
         const bool written = std::cout.good();
-        std::cout.rdbuf(itsOutput);  // clears the stream's state, and so does the next
+        std::cout.rdbuf(itsOutput);  // also clears the stream's state, as does the next line
         std::cerr.rdbuf(itsError);
         if (!written) {
             itsMessages.setstate(std::ios::badbit);

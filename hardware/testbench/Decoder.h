@@ -16,7 +16,7 @@ class TDecoder;
 
 namespace morvik {
 
-/// The library refused; the text is the line in which it told why.
+/// The library refused; what() is the line that says why.
 class Refusal : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
@@ -31,14 +31,14 @@ struct Decoded {
 
 /// A decoder, whose warnings and traces go to a stream of the caller's choice.
 ///
-/// The library writes to std::cout and std::cerr. During each call those two are redirected: the first to
-/// `messages`, the second into the text of a Refusal. When `messages` cannot be written, its badbit is set.
+/// The library writes to std::cout and std::cerr. Each call redirects the first to `messages`, the second into the text
+/// of a Refusal. If `messages` cannot be written, its badbit is set.
 class Decoder {
 public:
-    /// Throws Refusal when the generics are not allowed. `messages` outlives the decoder.
+    /// Throws Refusal if the generics are not allowed. `messages` must outlive the decoder.
     Decoder(const veltra_ip_morvik_v1_0_generics& generics, std::ostream& messages);
 
-    /// Decodes with another instruction set, as morvik_v1_0_batch.h names them. Throws Refusal.
+    /// Selects another instruction set, by its name in morvik_v1_0_batch.h. Throws Refusal.
     void useInstructionSet(const std::string& name);
 
     /// Traces the next `passes` half-iterations, counted across blocks.
@@ -47,10 +47,10 @@ public:
     /// Decodes a block into `bits`, one element of 0 or 1 for each bit. Throws Refusal.
     void decode(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag, std::vector<std::uint8_t>& bits);
 
-    /// Decodes a block of some bits, with its ratios. Throws Refusal.
+    /// Decodes a block of at least one bit, with its ratios. Throws Refusal.
     Decoded decodeWithRatios(const SoftBlock& block, std::uint32_t iterations, std::uint32_t tag);
 
-    /// The component that decodes, whose values a test bench watches. From now on it decodes every block.
+    /// The component that decodes, for test benches to observe. After this call it decodes every block.
     TDecoder& component();
 
 private:

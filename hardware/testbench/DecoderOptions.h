@@ -8,7 +8,7 @@
 
 namespace morvik {
 
-/// How to decode. As it is made, it is the one default of all subcommands: the library's own core.
+/// How to decode. The defaults are those of all subcommands: the library's own core.
 struct DecoderOptions {
     veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
     std::uint32_t iterations = 8;

@@ -9,7 +9,7 @@ namespace morvik {
 
 namespace {
 
-/// Signals of one kind begin here in passSignals.
+/// The first signal of each kind in passSignals.
 enum FirstSignal : unsigned { intrinsic = 0, branch = 1, forward = 5, backward = 13, ratio = 21, extrinsic = 22 };
 
 short alignedValue(const TDecoder& decoder, unsigned signal, std::uint32_t step)
