@@ -1,4 +1,4 @@
-// Algorithms: what the algorithms of the core are called.
+// Algorithms: the names of the core's algorithms.
 #ifndef MORVIK_RULES_ALGORITHMS_H
 #define MORVIK_RULES_ALGORITHMS_H
 
@@ -9,10 +9,10 @@
 
 namespace morvik::rules {
 
-/// By the numbers of C_ALGORITHM_TYPE, 0 to 2.
+/// Indexed by C_ALGORITHM_TYPE, 0 to 2.
 constexpr std::array<std::string_view, 3> algorithmNames = {"max-log", "scaled", "table"};
 
-/// The number of the algorithm of that name; nothing if there is none.
+/// Returns the number of the named algorithm, or nullopt if there is none.
 constexpr std::optional<unsigned> findAlgorithm(std::string_view name)
 {
     for (std::size_t i = 0; i < algorithmNames.size(); ++i) {

@@ -1,14 +1,14 @@
 // Arithmetic: the wraps, shifts, clips and masks of the hardware's numbers, each stated once.
 //
 // The numbered rules are those of docs/arithmetic.md. All functions are defined for every argument:
-// what the hardware loses in a register is computed in unsigned arithmetic here.
+// register overflow is computed in unsigned arithmetic.
 #ifndef MORVIK_RULES_ARITHMETIC_H
 #define MORVIK_RULES_ARITHMETIC_H
 
 #include <cstdint>
 
-// The steps over the trellis are short and run millions of times: no call may be left of them. Builds
-// without optimisation and with sanitizers keep their calls, or they would take for ever to compile.
+// Trellis steps are short and run millions of times, so all their calls are inlined. Unoptimised and
+// sanitizer builds keep the calls: inlined, they would take far too long to compile.
 #if defined(__has_feature)
 #define MORVIK_HAS_FEATURE(name) __has_feature(name)
 #else
@@ -36,20 +36,19 @@ constexpr Value wrap16(std::int32_t value)
     return static_cast<Value>(static_cast<std::uint16_t>(static_cast<std::uint32_t>(value) & 0xFFFFU));
 }
 
-/// value * 2^count modulo 2^32; like a barrel shifter of five bits, it looks at count modulo 32.
+/// value * 2^count modulo 2^32; count is taken modulo 32, as by a five-bit barrel shifter.
 constexpr std::int32_t shiftLeftWrap(std::int32_t value, std::uint32_t count)
 {
     return static_cast<std::int32_t>(static_cast<std::uint32_t>(value) << (count & 31U));
 }
 
-/// value / 2^count rounded down (the sign is shifted in), count modulo 32.
+/// value / 2^count rounded down (arithmetic shift), count modulo 32.
 constexpr std::int32_t shiftRight(std::int32_t value, std::uint32_t count)
 {
     return value >> (count & 31U);
 }
 
-/// value held between lo and hi, lo <= hi. (For lo > hi, which no format in use gives, a value below lo
-/// becomes lo.)
+/// value clamped to lo ... hi, lo <= hi. (If lo > hi, which no format in use gives, a value below lo becomes lo.)
 template <class Number>
 constexpr Number clip(Number value, Number lo, Number hi)
 {
@@ -68,13 +67,13 @@ constexpr Value subWrap(Value a, Value b)
     return wrap16(std::int32_t{a} - b);
 }
 
-/// c2 when the wrapped difference of two candidates is negative, c1 otherwise (rule 3).
+/// c2 if the wrapped difference of the two candidates is negative, else c1 (rule 3).
 constexpr Value select(Value difference, Value c1, Value c2)
 {
     return difference < 0 ? c2 : c1;
 }
 
-/// The greater of two metrics, told by the sign of their wrapped difference; a tie gives c1 (rule 3).
+/// The greater of two metrics by the sign of their wrapped difference; c1 on a tie (rule 3).
 constexpr Value maxWrap(Value c1, Value c2)
 {
     return select(subWrap(c1, c2), c1, c2);

@@ -1,5 +1,5 @@
-// BlockSizes: the block sizes of the LTE turbo code and the coefficients of their permutations, which the model and
-// the encoder of the simulation take from here.
+// BlockSizes: the block sizes of the LTE turbo code and their interleaver coefficients, shared by the model and the
+// simulation's encoder.
 #ifndef MORVIK_RULES_BLOCKSIZES_H
 #define MORVIK_RULES_BLOCKSIZES_H
 
@@ -50,7 +50,7 @@ inline constexpr std::array<BlockSize, 188> blockSizes{{
 }};
 // clang-format on
 
-/// The row for block size K, or null when K is no block size.
+/// Returns the row for block size K, or null if K is not a block size.
 inline const BlockSize* findBlockSize(std::uint32_t K)
 {
     const auto* const row =

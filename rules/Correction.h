@@ -1,4 +1,4 @@
-// Correction: an entry of the table ln(1 + e^-|d|) (rule 9 of docs/arithmetic.md).
+// Correction: the entries of the correction table ln(1 + e^-|d|) (rule 9 of docs/arithmetic.md).
 #ifndef MORVIK_RULES_CORRECTION_H
 #define MORVIK_RULES_CORRECTION_H
 
@@ -13,16 +13,16 @@ namespace morvik::rules {
 /// One entry for each signed 16-bit decision difference.
 constexpr std::uint32_t correctionEntries = 65536;
 
-/// The fraction bits of a difference that a table of 2^log2Points points resolves: eight points to one at most, and no
-/// more than the format has (rule 9).
+/// Returns how many fraction bits of a difference a table of 2^log2Points points resolves, at most those of the format
+/// (rule 9).
 constexpr std::uint32_t resolvedFractionBits(std::uint32_t formatsFractionBits, std::uint32_t log2Points)
 {
     return log2Points > 2 ? std::min(formatsFractionBits, log2Points - 3) : 0;
 }
 
-/// The correction scale * ln(1 + e^-|d|) of a decision difference d, an aligned word, rounded half away from zero, as
-/// an integer of the format; 0 from `range` on, as a real number. The `ignored` low bits of the magnitude do not count.
-/// The hardware forms the magnitude of a negative difference by inversion, so -1 reads like 0 (rule 9).
+/// Returns the correction scale * ln(1 + e^-|d|) of a decision difference d, an aligned word, as an integer of the
+/// format, rounded half away from zero; 0 where |d| as a real number is `range` or more. Clears the `ignored` low bits
+/// of the magnitude. The hardware forms the magnitude of a negative difference by inversion, so -1 reads as 0 (rule 9).
 inline std::int32_t correction(
     std::int32_t difference, std::uint32_t ignored, long double range, std::uint32_t alignment, std::uint32_t scale)
 {

@@ -1,4 +1,4 @@
-// Cut: how the core cuts a block into segments and windows, and which unit and thread works on a trellis step.
+// Cut: how the core cuts a block into segments and windows, and which unit and thread computes a trellis step.
 //
 // The numbered rules are those of docs/arithmetic.md.
 #ifndef MORVIK_RULES_CUT_H
@@ -12,10 +12,10 @@ namespace morvik::rules {
 /// Hardware threads of each processing unit.
 constexpr std::uint32_t threadsOfUnit = 4;
 
-/// Steps of a window at most, and of a segment at least where there is more than one.
+/// Maximum steps of a window; minimum steps of a segment if there are several.
 constexpr std::uint32_t longestWindow = 64;
 
-/// The number of segments doubles until every thread has one or they would become shorter than 64 steps
+/// Returns the number of segments: doubled until every thread has one or segments would become shorter than 64 steps
 /// (rule 17).
 constexpr std::uint32_t segmentCount(std::uint32_t K, std::uint64_t threads)
 {
@@ -26,17 +26,17 @@ constexpr std::uint32_t segmentCount(std::uint32_t K, std::uint64_t threads)
     return static_cast<std::uint32_t>(count);
 }
 
-/// Of windows that are numbered row by row, that which starts at the step where window `number`, other than 0,
-/// ends: the one before it in its segment, or the last one of the segment before (rule 20).
+/// Returns the window that starts at the step where window `number`, other than 0, ends: the one before it in its
+/// segment, or the last one of the segment before. Windows are numbered row by row (rule 20).
 template <class Number>
 constexpr Number windowBefore(Number number, Number segments, Number windows)
 {
     return number >= segments ? number - segments : windows - segments + number - 1;
 }
 
-/// A window of the backward recursion, which runs from its last step down to its first.
+/// A window of the backward recursion, which runs from the last step down to the first.
 struct Window {
-    std::uint32_t row;  ///< which window of its segment, from the segment's start
+    std::uint32_t row;  ///< index within the segment
     std::uint32_t segment;
     std::uint32_t first;  ///< trellis step
     std::uint32_t last;
@@ -50,9 +50,9 @@ struct StepPlace {
     std::uint32_t thread;  ///< of the unit
 };
 
-/// A block of K bits, cut for a number of units. Windows are numbered in the order in which the backward recursion
-/// takes them: one of each segment, row by row. Neighbouring segments share a unit; where there are fewer segments than
-/// threads, they are dealt to as many units as there are, since those compute at the same time.
+/// The cut of a block of K bits for a number of units. Windows are numbered in the order of the backward recursion: one
+/// window of each segment, row by row. Neighbouring segments share a unit. With fewer segments than threads, the
+/// segments spread over as many units as possible, since units run in parallel.
 class Cut {
 public:
     /// No block.
@@ -76,7 +76,7 @@ public:
         return itsUnits;
     }
 
-    /// Whether the segments are equally long; the core refuses a block in which they are not (rule 17).
+    /// Whether all segments are equally long; the core refuses any other block (rule 17).
     constexpr bool dividesEvenly() const
     {
         return itsK == itsSegments * itsLength;
@@ -93,15 +93,15 @@ public:
         return itsLength;
     }
 
-    /// Windows of each segment (rule 18).
+    /// Windows in each segment (rule 18).
     constexpr std::uint32_t rows() const
     {
         return fullRows() + (rest() > longestWindow ? 2 : rest() > 0 ? 1 : 0);
     }
 
-    /// The first step of a segment's window, counted from the segment's start: windows of 64 steps while 128 or more
-    /// remain, then the rest, whose 65 to 127 steps are two halves, the longer one first (rule 18). Behind the last
-    /// window, the segment's end.
+    /// Returns the first step of a window, counted from the segment's start: windows have 64 steps while 128 or more
+    /// remain; the rest is one window, or two halves if it has 65 to 127 steps, the longer one first (rule 18). After
+    /// the last window: the segment's end.
     constexpr std::uint32_t windowStart(std::uint32_t row) const
     {
         if (row <= fullRows()) {
@@ -140,7 +140,7 @@ public:
         return {segment, rowOf(ofBlock % itsLength), segment / segmentsOfUnit(), segment % segmentsOfUnit()};
     }
 
-    /// Units that have a segment.
+    /// Units with at least one segment.
     constexpr std::uint32_t unitsAtWork() const
     {
         return itsSegments / segmentsOfUnit();
@@ -157,15 +157,15 @@ public:
         return step < itsK && step % itsLength == 0;
     }
 
-    /// Whether no window follows: the backward recursion starts from the tail (rule 20).
+    /// Whether this is the block's last window, whose recursion starts from the tail (rule 20).
     constexpr bool startsAtTail(const Window& window) const
     {
         return window.last + 1 == itsK;
     }
 
-    /// Whether, but in the first pass, the window starts from a column of the same pass. The units fetch the start
-    /// columns of a row before they work on the row in front of it, so those of row 0 come in time for the last row
-    /// where a row lies between (rule 20).
+    /// Whether the window starts from a column of the same pass (except in the first pass). The units fetch a row's
+    /// start columns before they compute the preceding row, so the columns of row 0 reach the last row in time only if
+    /// there is a row in between (rule 20).
     constexpr bool startsFromThisPass(const Window& window) const
     {
         return rows() > 2 && window.row + 1 == rows() && !startsAtTail(window);
@@ -177,7 +177,7 @@ private:
         return itsLength < longestWindow ? 0 : itsLength / longestWindow - 1;
     }
 
-    /// Steps of a segment behind its full rows, at most 127.
+    /// Steps of a segment after its full rows, at most 127.
     constexpr std::uint32_t rest() const
     {
         return itsLength - longestWindow * fullRows();

@@ -1,4 +1,4 @@
-// Interleaver: the order in which the second constituent code takes a block (rule 15 of docs/arithmetic.md).
+// Interleaver: the order of a block in the second constituent code (rule 15 of docs/arithmetic.md).
 #ifndef MORVIK_RULES_INTERLEAVER_H
 #define MORVIK_RULES_INTERLEAVER_H
 
@@ -8,9 +8,9 @@
 
 namespace morvik::rules {
 
-/// The addresses Pi(i) = (f1 i + f2 i^2) mod K for i = 0, 1, ... K - 1: position i of the interleaved order is position
-/// Pi(i) of the natural one (rule 15). Pi(i + 1) = Pi(i) + step(i) and step(i + 1) = step(i) + 2 f2, both modulo K: a
-/// generator of two adders. Every sum is below 2 K.
+/// Generates the addresses Pi(i) = (f1 i + f2 i^2) mod K for i = 0, 1, ... K - 1: position i of the interleaved order
+/// is position Pi(i) of the natural one (rule 15). Two adders suffice: Pi(i + 1) = Pi(i) + step(i) and step(i + 1) =
+/// step(i) + 2 f2, both modulo K. Every sum is below 2 K.
 class InterleaverAddress {
 public:
     explicit constexpr InterleaverAddress(const BlockSize& size)
@@ -18,7 +18,7 @@ public:
     {
     }
 
-    /// Pi(0) at first, and with each further call the one that follows.
+    /// Returns Pi(0) on the first call, then the next address on each call.
     constexpr std::uint32_t next()
     {
         const std::uint32_t position = itsPosition;
@@ -28,7 +28,7 @@ public:
     }
 
 private:
-    /// Modulo K.
+    /// a + b modulo K.
     constexpr std::uint32_t sum(std::uint32_t a, std::uint32_t b) const
     {
         return a + b >= itsK ? a + b - itsK : a + b;

@@ -1,14 +1,13 @@
 // Trellis: the constituent code of 3GPP TS 36.212, clause 5.1.3.2.1, and the steps over it.
 //
-// Everything here is written once, over a value type: a 16-bit word in the kernels of the engine,
-// or a vector of such words; a value type offers addWrap, subWrap, maxWrap and select. How a decision
-// is made is a policy (TrellisDecision.h):
-//   Metric               what a decision yields and the next one takes
+// Everything is templated on a value type: a 16-bit word in the engine's kernels, or a vector of such words. A value
+// type offers addWrap, subWrap, maxWrap and select. Decisions are a policy (TrellisDecision.h):
+//   Metric               the result of a decision and the operand of the next
 //   metric(value)        a metric from a plain value, nothing pending
 //   add, subtract        a metric plus or minus a plain value
 //   decide(c1, c2)       the decision between two candidates
-//   stored(metric)       the value kept in a column
-//   settled(metric)      the value of a last decision, nothing left pending
+//   stored(metric)       the value stored in a column
+//   settled(metric)      the value after the last decision, pending corrections included
 #ifndef MORVIK_RULES_TRELLIS_H
 #define MORVIK_RULES_TRELLIS_H
 
@@ -22,11 +21,11 @@ namespace morvik::rules {
 
 constexpr unsigned stateCount = 8;
 
-/// Where the encoder goes from each state on information bit 1: the feedback polynomial is
-/// 1 + D^2 + D^3, and the first delay element is the state's most significant bit.
+/// The next state of each state on information bit 1. The feedback polynomial is 1 + D^2 + D^3; the
+/// first delay element is the state's most significant bit.
 constexpr unsigned successorOfOne[stateCount] = {4, 0, 1, 5, 6, 2, 3, 7};
 
-/// The state after `bit`. The other bit complements what enters the first delay element.
+/// The state after `bit`. Bit 0 complements the input of the first delay element.
 constexpr unsigned successor(unsigned state, unsigned bit)
 {
     return bit != 0 ? successorOfOne[state] : successorOfOne[state] ^ 4U;
@@ -42,7 +41,7 @@ constexpr unsigned predecessor(unsigned state, unsigned bit)
     return from;
 }
 
-/// The branch metric of a state's two outgoing branches, counted + for bit 1 and - for bit 0: the
+/// The index of the branch metric of a state's outgoing branches, added for bit 1 and subtracted for bit 0. The
 /// parity bit, from the feed-forward polynomial 1 + D + D^3, is the same for both states of a pair.
 constexpr unsigned branch(unsigned state)
 {
@@ -55,7 +54,7 @@ MORVIK_INLINE constexpr void unrolled([[maybe_unused]] Step step, std::integer_s
     (step(std::integral_constant<unsigned, index>{}), ...);
 }
 
-/// Calls step(0) to step(count - 1) with indices that are constants, so that columns stay in registers.
+/// Calls step(0) to step(count - 1) with constant indices, so that columns stay in registers.
 template <unsigned count, class Step>
 MORVIK_INLINE constexpr void forEach([[maybe_unused]] Step step)
 {
@@ -68,7 +67,7 @@ using BranchMetrics = std::array<Value, 4>;
 template <class Decision>
 using Column = std::array<typename Decision::Metric, stateCount>;
 
-/// The four branch metrics of a step before they are clipped: 2 i +- p +- q (rule 5).
+/// The four branch metrics of a step before clipping: 2 i +- p +- q (rule 5).
 template <class Wide>
 MORVIK_INLINE constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide parity0, Wide parity1)
 {
@@ -78,7 +77,7 @@ MORVIK_INLINE constexpr BranchMetrics<Wide> branchSums(Wide twiceIntrinsic, Wide
             twiceIntrinsic + parity0 - parity1};
 }
 
-/// Makes branch metrics of the sums: clips them to the branch format's limits. The tail's are not (rules 5 and 12).
+/// Clips branch sums to the branch format's limits; the tail's are not clipped (rules 5 and 12).
 template <class Wide>
 MORVIK_INLINE constexpr void clipBranches(BranchMetrics<Wide>& sums, int lo, int hi)
 {
@@ -87,7 +86,7 @@ MORVIK_INLINE constexpr void clipBranches(BranchMetrics<Wide>& sums, int lo, int
     }
 }
 
-/// Forward: the column after a step, each state decided between its two predecessors, the one on bit 1
+/// Returns the column after a step; each state decides between its two predecessors, the one on bit 1
 /// first (rule 6).
 template <class Decision, class Value>
 MORVIK_INLINE constexpr Column<Decision> forwardStep(const Decision& rule,
@@ -98,14 +97,14 @@ MORVIK_INLINE constexpr Column<Decision> forwardStep(const Decision& rule,
     forEach<stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
         constexpr unsigned one = predecessor(state, 1);
         constexpr unsigned zero = predecessor(state, 0);
-        constexpr unsigned pair = branch(one);  // the two are one
+        constexpr unsigned pair = branch(one);  // the same for both
         next[state] = rule.decide(rule.add(a[one], g[pair]), rule.subtract(a[zero], g[pair]));
     });
     return next;
 }
 
-/// The metrics of the branches that leave the two states of a pair, the even state's first, the backward
-/// metric of the far end included.
+/// The metrics of the branches that leave the two states of a pair, the even state's first, including the backward
+/// metric of the next state.
 template <class Decision>
 struct Candidates {
     typename Decision::Metric one[2];   ///< on bit 1
@@ -121,9 +120,9 @@ MORVIK_INLINE constexpr Candidates<Decision> candidates(const Decision& rule, co
             {rule.subtract(b[successor(even, 0)], g), rule.subtract(b[successor(odd, 0)], g)}};
 }
 
-/// Backward: the column before a step, each state decided between its two successors, the one on bit 1
-/// first (rule 6). The states of a pair have the same successors, so a pair is done before the next begins;
-/// use(pair, candidates) is told what it was decided from.
+/// Returns the column before a step; each state decides between its two successors, the one on bit 1
+/// first (rule 6). The states of a pair share their successors, so the pair is computed together;
+/// use(pair, candidates) receives its candidates.
 template <class Decision, class Value, class Use>
 MORVIK_INLINE constexpr Column<Decision> backwardStep(const Decision& rule,
                                                       const Column<Decision>& b,
@@ -148,9 +147,9 @@ MORVIK_INLINE constexpr Column<Decision> backwardStep(const Decision& rule,
     return backwardStep(rule, b, g, [](auto, const Candidates<Decision>&) {});
 }
 
-/// The best metric of all branches with `bit`, as a tree of decisions: the two states of a pair
-/// share a branch metric, so they are decided first, the odd one being the first candidate, then
-/// pairs, then halves (rule 8).
+/// The best metric of all branches with `bit`, by a decision tree: first between the states of a pair,
+/// which share a branch metric, the odd one as first candidate, then between pairs, then between
+/// halves (rule 8).
 template <unsigned bit, class Decision, class Value>
 MORVIK_INLINE constexpr Value bestPath(const Decision& rule,
                                        const std::array<Value, stateCount>& a,
@@ -170,7 +169,7 @@ MORVIK_INLINE constexpr Value bestPath(const Decision& rule,
     return rule.settled(rule.decide(rule.decide(pair[0], pair[1]), rule.decide(pair[2], pair[3])));
 }
 
-/// The log-likelihood ratio of a step; positive favours bit 1. It wraps like the metrics (rule 8).
+/// The log-likelihood ratio of a step; positive favours bit 1. Wraps like the metrics (rule 8).
 template <class Decision, class Value>
 MORVIK_INLINE constexpr Value logLikelihoodRatio(const Decision& rule,
                                                  const std::array<Value, stateCount>& a,
@@ -180,7 +179,7 @@ MORVIK_INLINE constexpr Value logLikelihoodRatio(const Decision& rule,
     return subWrap(bestPath<1>(rule, a, b, g), bestPath<0>(rule, a, b, g));
 }
 
-/// The three steps of the termination tail: systematic values and those of the parity streams.
+/// Systematic and parity values of the three tail steps.
 template <class Wide>
 struct Tail {
     Wide x[3];
@@ -188,8 +187,8 @@ struct Tail {
     Wide q[3];
 };
 
-/// The backward metrics before the tail, in closed form: from each state, one path leads back to state 0
-/// (rule 12). They are neither clipped nor wrapped here.
+/// The backward metrics before the tail, in closed form: one path leads from each state back to state 0
+/// (rule 12). Neither clipped nor wrapped.
 template <class Wide>
 constexpr std::array<Wide, stateCount> tailColumn(const Tail<Wide>& t)
 {

@@ -1,8 +1,7 @@
 // TrellisDecision: the three ways to decide between two candidates at a trellis state (rule 7).
 //
-// Which candidate is the first matters for ties and for the table's index; the steps in Trellis.h say
-// which it is. A table is anything that can be called with a decision difference and returns its
-// correction, aligned like the metrics.
+// The order of the candidates, given in Trellis.h, matters for ties and for the table's index. A table is
+// any callable that maps a decision difference to its correction, aligned like the metrics.
 #ifndef MORVIK_RULES_TRELLISDECISION_H
 #define MORVIK_RULES_TRELLISDECISION_H
 
@@ -10,7 +9,7 @@
 
 namespace morvik::rules {
 
-/// Decisions that leave nothing pending: a metric is a plain value.
+/// Decisions with nothing pending: a metric is a plain value.
 template <class Value>
 struct PlainMetrics {
     using Metric = Value;
@@ -50,7 +49,7 @@ struct DecideMax : PlainMetrics<Value> {
     }
 };
 
-/// "MOD*": the greater candidate plus the correction for how close the two were.
+/// "MOD*": the greater candidate plus the correction for the difference.
 template <class Value, class Table>
 struct DecideMaxStar : PlainMetrics<Value> {
     Table table;
@@ -63,16 +62,15 @@ struct DecideMaxStar : PlainMetrics<Value> {
     }
 };
 
-/// A metric whose last decision's correction is still to be added.
+/// A metric with the correction of its last decision still pending.
 template <class Value>
 struct PendingMetric {
     Value value;
     Value pending;
 };
 
-/// "MOD#": the correction of a decision arrives one stage late. Candidates are compared without
-/// what is pending; the winner takes its pending correction along. This takes the table out of the
-/// hardware's critical loop.
+/// "MOD#": adds the correction of a decision one stage late. Candidates are compared without pending
+/// corrections; the winner's is then added. This takes the table out of the hardware's critical loop.
 template <class Value, class Table>
 struct DecideMaxHash {
     using Metric = PendingMetric<Value>;
