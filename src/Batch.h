@@ -1,4 +1,4 @@
-// Batch: the blocks of a call, all of one size, as the caller hands them over.
+// Batch: the blocks of a call, all of one size, in the caller's memory.
 #ifndef MORVIK_SRC_BATCH_H
 #define MORVIK_SRC_BATCH_H
 
@@ -12,7 +12,7 @@
 
 namespace morvik::simulation_call {
 
-/// A single call hands over a batch of one.
+/// A call for a single block is a batch of one.
 struct Batch {
     using Streams = std::variant<morvik::lanes::Streams<std::int32_t>,
                                  morvik::lanes::Streams<std::int16_t>,
@@ -24,7 +24,7 @@ struct Batch {
     std::uint32_t iterations;
     const std::uint32_t* tags;  ///< null: all are 0
 
-    /// K; 0 also where the positions cannot hold the tail.
+    /// K; 0 also if there are too few positions for the tail.
     unsigned blockSize() const
     {
         return dinSize < std::int32_t{morvik::rules::tailPositions}
@@ -37,7 +37,7 @@ struct Batch {
         return tags == nullptr ? 0 : morvik::lanes::valueAt(tags, block);
     }
 
-    /// Of all blocks' streams those of one block.
+    /// Returns the streams of one block.
     template <class Input>
     morvik::lanes::Streams<Input> streamsOf(const morvik::lanes::Streams<Input>& all, std::size_t block) const
     {

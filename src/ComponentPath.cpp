@@ -1,4 +1,4 @@
-// ComponentPath: blocks through the state's components, one at a time.
+// ComponentPath: decodes blocks with the state's components, one at a time.
 #include "ComponentPath.h"
 
 #include <algorithm>
@@ -12,7 +12,7 @@ using morvik::simulation_call::Status;
 
 namespace {
 
-/// Calls decode(decoder) when the metric columns are what all earlier blocks left; returns how it ended.
+/// Brings the metric columns up to date with all earlier blocks, then calls decode(decoder) and returns its status.
 template <class Decode>
 Status decodeWith(veltra_ip_morvik_v1_0_state& state, Decode decode)
 {

@@ -1,4 +1,4 @@
-// ComponentPath: blocks through the state's components, one at a time.
+// ComponentPath: decodes blocks with the state's components, one at a time.
 #ifndef MORVIK_SRC_COMPONENTPATH_H
 #define MORVIK_SRC_COMPONENTPATH_H
 
@@ -11,7 +11,7 @@ class ComponentPath : public BlockPath {
 public:
     explicit ComponentPath(veltra_ip_morvik_v1_0_state& state) : itsState(state) {}
 
-    /// Takes one block, and joins its three streams, position by position, into aligned soft values.
+    /// Takes one block and interleaves its three streams, position by position, into aligned soft values.
     unsigned take(const morvik::simulation_call::Batch& batch, std::size_t first, unsigned most) override;
 
     morvik::simulation_call::Status decode(unsigned iterations) override;
@@ -24,7 +24,7 @@ public:
 
 private:
     veltra_ip_morvik_v1_0_state& itsState;
-    unsigned itsBlockSize = 0;  ///< K of the block that was taken
+    unsigned itsBlockSize = 0;  ///< K of the block taken
     std::vector<short> itsSoft;
     std::vector<unsigned char> itsHard;
 };

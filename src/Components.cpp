@@ -1,4 +1,4 @@
-// Components: the six components of a state, made from its generics.
+// Components: creates the six components of a state from its generics.
 #include "Components.h"
 
 #include <string>

@@ -1,4 +1,4 @@
-// Components: the six components of a state, made from its generics.
+// Components: creates the six components of a state from its generics.
 #ifndef MORVIK_SRC_COMPONENTS_H
 #define MORVIK_SRC_COMPONENTS_H
 
@@ -8,10 +8,10 @@ namespace morvik::components {
 
 using State = veltra_ip_morvik_v1_0_state;
 
-/// Makes a state's components from its generics; null, or what failed. Exhausted memory throws std::bad_alloc.
+/// Creates a state's components from its generics. Returns null, or what failed. Throws std::bad_alloc.
 const char* create(State& state);
 
-/// Releases a state's components and forgets them.
+/// Deletes a state's components and nulls their pointers.
 void release(State& state);
 
 }  // namespace morvik::components

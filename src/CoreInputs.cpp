@@ -1,4 +1,4 @@
-// CoreInputs: what the core takes in of a caller's soft values and tags, and the warnings of what it cuts off.
+// CoreInputs: converts a caller's soft values and tags to the core's widths, and warns of what is cut off.
 #include "CoreInputs.h"
 
 #include "Messages.h"

@@ -1,4 +1,4 @@
-// CoreInputs: what the core takes in of a caller's soft values and tags, and the warnings of what it cuts off.
+// CoreInputs: converts a caller's soft values and tags to the core's widths, and warns of what is cut off.
 #ifndef MORVIK_SRC_COREINPUTS_H
 #define MORVIK_SRC_COREINPUTS_H
 
@@ -15,14 +15,14 @@ namespace morvik::core_inputs {
 
 using State = veltra_ip_morvik_v1_0_state;
 
-/// The tag's bits that the core carries. The first tag of a state's life that loses bits is reported.
+/// Returns the tag bits that the core carries. Reports only the first tag of a state that loses bits.
 std::uint32_t truncateTag(State& state, std::uint32_t tag);
 
-/// Reports that a value has been clipped, which is done once in a state's life.
+/// Reports a clipped value; called once for each state.
 void reportSaturation(State& state, unsigned stream, std::int32_t position, bool positively);
 
-/// Calls use(stream, position, integer) for each soft value of a block, position by position, and reports the first
-/// of the state's life that is clipped.
+/// Calls use(stream, position, integer) for each soft value of a block, position by position. Reports only the state's
+/// first clipped value.
 template <class Use>
 void forEachSoftValue(State& state, const simulation_call::Batch& batch, std::size_t block, Use use)
 {

@@ -1,4 +1,4 @@
-// DecoderState: the record behind the opaque pointer of the C interface.
+// DecoderState: the struct behind the opaque pointer of the C interface.
 #ifndef MORVIK_SRC_DECODERSTATE_H
 #define MORVIK_SRC_DECODERSTATE_H
 
@@ -12,8 +12,8 @@
 
 class PathChoice;
 
-/// A decoder state owns its six components; they refer to each other by plain links. The record is
-/// taken from malloc and given to free.
+/// A decoder state. Owns its six components, which refer to each other by raw pointers. Allocated by
+/// malloc, released by free.
 struct veltra_ip_morvik_v1_0_state {
     veltra_ip_morvik_v1_0_generics generics;
     TDecoder* decoder;
@@ -22,10 +22,10 @@ struct veltra_ip_morvik_v1_0_state {
     TNumberFormat* state_format;
     TNumberFormat* input_format;
     TNumberFormat* branch_format;
-    bool saturation_reported;      ///< whether the one saturation warning has been given
-    bool tag_truncation_reported;  ///< whether the one tag truncation warning has been given
+    bool saturation_reported;      ///< whether the saturation warning has been given
+    bool tag_truncation_reported;  ///< whether the tag truncation warning has been given
     std::uint32_t tag_mask;        ///< the tag bits that are kept
-    PathChoice* path_choice;       ///< null in a record of a test bench's own components, which then decode
+    PathChoice* path_choice;       ///< null if a test bench filled in its own components, which then decode
 };
 
 #endif

@@ -1,4 +1,4 @@
-// LanePath: blocks through the lane-parallel decoder, which gives what the state's components would.
+// LanePath: decodes blocks with the lane-parallel decoder, with the same results as the state's components.
 #include "LanePath.h"
 
 #include "CoreInputs.h"
@@ -10,7 +10,7 @@ using morvik::simulation_call::Status;
 
 namespace {
 
-/// The engine's table, by quarters of a difference's magnitude in steps: its finest resolution (rule 9).
+/// The engine's table, indexed by a quarter of a difference's magnitude in steps: its finest resolution (rule 9).
 morvik::lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
 {
     morvik::lanes::CorrectionTable table = {};
@@ -34,7 +34,7 @@ std::uint32_t differences(const std::uint8_t* decisions, const std::uint8_t* sen
     return differing;
 }
 
-/// The places of blocks of K values each, one after the other.
+/// Sets the addresses of consecutive blocks of K values each.
 template <class Value>
 void setPlaces(std::vector<Value*>& blocks, Value* first, std::size_t K)
 {
@@ -86,7 +86,7 @@ unsigned LanePath::take(const Batch& batch, std::size_t first, unsigned most)
     return itsTaken;
 }
 
-/// Makes everything ready for blocks of K bits.
+/// Sets up the lanes for blocks of K bits.
 void LanePath::prepare(unsigned K)
 {
     const unsigned lastK = itsLanes->cut().K();
@@ -101,7 +101,7 @@ void LanePath::prepare(unsigned K)
     itsMissedBlocks.overwrite(K);
 }
 
-/// False when a value is beyond the input format: the blocks have to be loaded again, clipped.
+/// Returns false if a value is outside the input format: the blocks must then be loaded clipped.
 template <class Input>
 bool LanePath::load(const Batch& batch, const morvik::lanes::Streams<Input>& all, std::size_t first, unsigned most)
 {
@@ -116,7 +116,7 @@ bool LanePath::load(const Batch& batch, const morvik::lanes::Streams<Input>& all
     return itsLanes->load(blocks.data(), most);
 }
 
-/// Warnings come in the order of single calls: that of a block's tag before those of the next block's values.
+/// Clips and loads blocks. Warns in the order of single calls: of a block's tag before the next block's values.
 void LanePath::loadClipped(const Batch& batch, std::size_t first)
 {
     const auto size = static_cast<std::size_t>(batch.dinSize);

@@ -1,4 +1,4 @@
-// LanePath: blocks through the lane-parallel decoder, which gives what the state's components would.
+// LanePath: decodes blocks with the lane-parallel decoder, with the same results as the state's components.
 #ifndef MORVIK_SRC_LANEPATH_H
 #define MORVIK_SRC_LANEPATH_H
 
@@ -15,7 +15,7 @@
 #include "lanes/InstructionSets.h"
 #include "lanes/LaneDecoder.h"
 
-/// Keeps the counters of the state's original decoder, and hands over the blocks that this misses.
+/// Updates the counters of the state's original decoder, and passes on the blocks that it misses.
 class LanePath : public BlockPath {
 public:
     LanePath(veltra_ip_morvik_v1_0_state& state,
@@ -35,10 +35,10 @@ public:
     void decisions(std::uint8_t* to) override;
     void ratios(std::int16_t* to) override;
 
-    /// Adds the last decoded block to the missed ones: of blocks of one size only its columns would remain.
+    /// Adds the last decoded block to the missed blocks: among blocks of one size, only its columns would remain.
     void handOverLastBlock();
 
-    /// Hands over nothing of what was decoded so far.
+    /// Discards the blocks decoded so far: none is handed over.
     void forgetBlocks();
 
 private:
@@ -60,9 +60,9 @@ private:
     const morvik::lanes::CorrectionTable itsCorrections;
     std::unique_ptr<morvik::lanes::LaneDecoder> itsLanes;
     unsigned itsTaken = 0;       ///< blocks
-    unsigned itsIterations = 0;  ///< that these were decoded with; 0: not yet
+    unsigned itsIterations = 0;  ///< of their decode; 0: not decoded yet
 
-    // Where the blocks that were taken are, and where their results go: room that is kept from call to call.
+    // The addresses of the blocks taken and of their results; storage is reused from call to call.
     std::tuple<Blocks<std::int32_t>, Blocks<std::int16_t>, Blocks<std::int8_t>> itsBlocks;
     std::vector<std::uint8_t*> itsDecisions;
     std::vector<std::int16_t*> itsRatios;

@@ -1,5 +1,5 @@
-// MessageStreams: the streams that messages go to, those of the process. A program that is linked from the library's
-// objects can have a unit of its own in this one's place.
+// MessageStreams: the streams of messages, those of the process. A program linked from the library's objects can
+// replace this file by its own.
 #include <iostream>
 
 #include "Messages.h"

@@ -1,4 +1,4 @@
-// Messages: how a line is put together and written.
+// Messages: composes and writes lines.
 #include "Messages.h"
 
 namespace morvik::messages {

@@ -1,8 +1,8 @@
-// Messages: the one way in which the library writes to the process's standard streams.
+// Messages: the library's only output to the process's standard streams.
 //
-// Every message is one line, written at once and flushed. Parts are put together as characters, never
-// with formatted insertion, so that a host program's stream flags (std::hex, a field width) and
-// locale cannot change a line, and so that a message needs no memory from the heap.
+// Every message is one line, written in one piece and flushed. Parts are concatenated as characters, never
+// with formatted insertion: a host program's stream flags (std::hex, a field width) and locale cannot
+// change a line, and a message needs no heap memory.
 #ifndef MORVIK_SRC_MESSAGES_H
 #define MORVIK_SRC_MESSAGES_H
 
@@ -20,7 +20,7 @@ std::ostream& output();
 /// The stream that carries errors: the process's standard error (MessageStreams.cpp).
 std::ostream& error();
 
-/// The characters of one part of a line: a text, a character, or an integer in decimal.
+/// The text of one part of a line: a string, a character, or an integer in decimal.
 class Characters {
 public:
     template <class Part>
@@ -50,7 +50,7 @@ private:
     std::string_view itsText;
 };
 
-/// Writes one part of a line that is longer than a message.
+/// Writes one part of a line too long for a message.
 template <class Part>
 void writePart(std::ostream& os, const Part& part)
 {
@@ -58,8 +58,8 @@ void writePart(std::ostream& os, const Part& part)
     os.write(characters.text().data(), static_cast<std::streamsize>(characters.text().size()));
 }
 
-/// Collects a line and writes it at once, so that the lines of two threads do not mix; one of more
-/// than 1023 characters goes out in pieces.
+/// Collects a line and writes it in one piece, so that lines of two threads do not mix; a line of more than
+/// 1023 characters is written in several.
 class LineBuffer {
 public:
     explicit LineBuffer(std::ostream& os) : itsStream(os) {}
@@ -77,7 +77,7 @@ private:
     char itsText[1024] = {};
 };
 
-/// Writes the parts one after the other as a line and flushes the stream.
+/// Writes the parts as one line and flushes the stream.
 template <class... Parts>
 void writeLine(std::ostream& os, const Parts&... parts)
 {
@@ -86,8 +86,8 @@ void writeLine(std::ostream& os, const Parts&... parts)
     line.end();
 }
 
-/// Writes a line on a standard stream. A host program may have set that stream to throw when it
-/// fails; a message that is lost so must not cost the caller more than the message.
+/// Writes a line to a standard stream. If the host program has set the stream to throw on failure, only
+/// the message is lost.
 template <class... Parts>
 void writeMessage(std::ostream& os, const Parts&... parts) noexcept
 {
@@ -98,14 +98,14 @@ void writeMessage(std::ostream& os, const Parts&... parts) noexcept
     }
 }
 
-/// Writes an error line on the standard error stream.
+/// Writes an error line to standard error.
 template <class... Parts>
 void writeError(const Parts&... parts) noexcept
 {
     writeMessage(error(), parts...);
 }
 
-/// Writes a warning line on the standard output stream.
+/// Writes a warning line to standard output.
 template <class... Parts>
 void writeWarning(const Parts&... parts) noexcept
 {

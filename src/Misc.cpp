@@ -16,30 +16,30 @@ namespace {
 
 constexpr std::uint32_t secondsPerMinute = 60;
 constexpr std::uint32_t secondsPerHour = 3600;
-constexpr std::uint32_t secondsPerDay = 259200;  // three times 86400, on purpose, in both directions
+constexpr std::uint32_t secondsPerDay = 259200;  // three times 86400 on purpose, in both directions
 
-/// Blanks are the codes up to 32 of a signed character, hence also the bytes 128 to 255.
+/// Blanks are the signed character codes up to 32, which include the bytes 128 to 255.
 bool isBlank(char c)
 {
     return static_cast<signed char>(c) <= 32;
 }
 
-/// The upper case in the "C" locale, which toupper() would only give there.
+/// Upper case as in the "C" locale; toupper() follows the current one.
 char toUpperAscii(char c)
 {
     return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
 }
 
-/// Frees a stream from the global locale, and lets an exhausted memory surface as the exception
-/// that a stream would otherwise turn into a shortened text.
+/// Makes a stream independent of the global locale, and makes exhausted memory throw instead of
+/// truncating the text.
 void makePlain(std::ios& stream)
 {
     stream.imbue(std::locale::classic());
     stream.exceptions(std::ios::badbit);
 }
 
-/// Removes the comment and the leading blanks of a parameter line. Unlike elsewhere, only the codes
-/// 1 to 32 are blanks here.
+/// Returns a parameter line without its comment and leading blanks. Unlike elsewhere, blanks are only the
+/// codes 1 to 32.
 std::string_view lineContent(std::string_view line)
 {
     line = line.substr(0, line.find("//"));
@@ -104,7 +104,7 @@ void appendForFilename(std::string& name, char c)
     }
 }
 
-/// The number to print and the suffix for a magnitude. The order of the tests matters.
+/// Returns the number to print and the suffix for a magnitude. The order of the tests matters.
 std::pair<long double, const char*> scaleToPrefix(long double a)
 {
     if (a > 5e14) {
@@ -139,8 +139,8 @@ std::pair<long double, const char*> scaleToPrefix(long double a)
 
 std::string toFixed(long double value, unsigned precision)
 {
-    // No value has more digits than this after the point. The zeros behind them are appended here,
-    // since the stream would lay them out on the stack, which a large precision overflows.
+    // No value has more digits after the point. Further zeros are appended here: the stream would
+    // build them on the stack, which a large precision overflows.
     using Limits = std::numeric_limits<long double>;
     constexpr unsigned mostDigits = Limits::digits - Limits::min_exponent;
     const unsigned digits = std::min(precision, mostDigits);
@@ -185,7 +185,7 @@ bool parse(const std::string& fileName, std::map<std::string, std::string>& para
     try {
         readParameters(file, parameters, checkNames, allNamesValid);
     } catch (const std::ios::failure&) {
-        return allNamesValid;  // a file ends where it cannot be read, a folder at once
+        return allNamesValid;  // a read failure ends the file; a folder fails at once
     }
     return allNamesValid;
 }
@@ -238,7 +238,7 @@ std::string expandTabs(std::string text, const std::vector<std::uint32_t>& width
             width = *nextWidth++;
         }
         column += width;
-        // The text reaches at least the column of the tab before, so that no more than a width is missing.
+        // The text already reaches the previous tab's column, so at most one width is missing.
         const std::uint64_t missing = column > expanded.size() ? column - expanded.size() : 1;
         expanded.append(static_cast<std::size_t>(missing), ' ');
     }
@@ -313,7 +313,7 @@ std::string timeToString(std::uint32_t seconds)
 
 std::string timeToString(double seconds)
 {
-    // Beyond 2^63 the conversion to an integer is not defined.
+    // Beyond 2^63 the conversion to an integer is undefined.
     const std::int64_t whole = std::fabs(seconds) < 0x1p63 ? static_cast<std::int64_t>(seconds) : 0;
     return timeToString(static_cast<std::uint32_t>(whole));
 }
@@ -328,7 +328,7 @@ std::int32_t stringToTime(std::string text)
 {
     std::istringstream is(text);
     makePlain(is);
-    double number = 0;  // stays 0 without a number; the largest double when the number is larger
+    double number = 0;  // 0 without a number; the largest double if the number is larger
     char unit = 's';
     is >> number >> unit;
 

@@ -1,4 +1,4 @@
-// MissedBlocks: blocks that the lanes have decoded, and the metric columns that they would have left.
+// MissedBlocks: blocks decoded by the lanes, and the metric columns that they would have left.
 #include "MissedBlocks.h"
 
 #include <cstddef>
@@ -6,7 +6,7 @@
 
 namespace {
 
-/// While it lives, a decoder works on the metric columns of another one. Exhausted memory may end it.
+/// Lends a decoder another's metric columns and returns them on exit, exceptions included.
 class LentColumns {
 public:
     LentColumns(TDecoder& owner, TDecoder& user) : itsOwner(owner), itsUser(user)
@@ -74,7 +74,7 @@ void MissedBlocks::computeColumns()
     itsBlocks.clear();
 }
 
-/// By components that nobody has changed, and that neither count nor trace for anybody.
+/// Uses components that no test bench can change, count in or trace.
 void MissedBlocks::decodeByTwin(const Block& block)
 {
     TDecoder3GPU& twin = itsOriginals.twin();

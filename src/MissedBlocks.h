@@ -1,4 +1,4 @@
-// MissedBlocks: blocks that the lanes have decoded, and the metric columns that they would have left.
+// MissedBlocks: blocks decoded by the lanes, and the metric columns that they would have left.
 #ifndef MORVIK_SRC_MISSEDBLOCKS_H
 #define MORVIK_SRC_MISSEDBLOCKS_H
 
@@ -7,14 +7,14 @@
 #include "OriginalComponents.h"
 #include "lanes/LaneDecoder.h"
 
-/// A trace also shows cells of the metric columns that its own block does not write: what earlier blocks left there.
-/// The lanes write no columns. Before the components work again, this computes the columns of the blocks that they
-/// missed. Few blocks are enough: each overwrites what earlier ones of its size or less have left.
+/// Recomputes the metric columns of blocks decoded by the lanes, which write none, before the components decode again.
+/// A trace also shows column entries that its own block does not write, left over from earlier blocks. Few blocks need
+/// to be kept: each overwrites the columns of earlier blocks of its size or smaller.
 class MissedBlocks {
 public:
     explicit MissedBlocks(OriginalComponents& originals) : itsOriginals(originals) {}
 
-    /// Adds a block that the lanes have decoded.
+    /// Adds a block decoded by the lanes.
     void add(morvik::lanes::LoadedBlock input, unsigned K, unsigned iterations);
 
     /// Drops the blocks that a decode of K bits overwrites.
@@ -23,7 +23,7 @@ public:
     /// Drops all blocks: the state has another decoder.
     void forget();
 
-    /// Makes the columns of the original decoder what they would be had it decoded these blocks.
+    /// Sets the original decoder's columns as if it had decoded these blocks.
     void computeColumns();
 
 private:

@@ -1,4 +1,4 @@
-// OriginalComponents: a state's components as create_state made them, and whether somebody has changed them since.
+// OriginalComponents: a state's components as create_state made them, and whether they have changed since.
 #include "OriginalComponents.h"
 
 #include <algorithm>
@@ -17,7 +17,7 @@ namespace {
 
 using State = OriginalComponents::State;
 
-/// A value of any kind by its bits, so that one that is not a number equals itself.
+/// The bits of a value of any type, so that NaN equals itself.
 template <class Value>
 std::uint64_t bitsOf(Value value)
 {
@@ -53,7 +53,7 @@ void useFormat(const TNumberFormat& format, Use& use)
             format.itsMask);
 }
 
-/// Calls use(bits) for each value that decides how components of the types that create_state makes decode.
+/// Calls use(bits) for each value that affects decoding, for components of the types that create_state makes.
 template <class Use>
 void useValues(const State& state, Use use)
 {
@@ -100,10 +100,10 @@ bool haveTheirTypes(const State& state)
            (engine == typeid(TCalculationEngineMod) || engine == typeid(TCalculationEngineModHash));
 }
 
-/// No difference of so many steps or more is corrected (rule 9).
+/// Differences of this many steps or more have no correction (rule 9).
 constexpr int correctedSteps = 64;
 
-/// The entries that correct, of all three tables of the engine.
+/// The non-zero range of the engine's three correction tables.
 std::vector<unsigned char> correctionsOf(const State& state)
 {
     const unsigned char* const anchor = static_cast<const TCalculationEngineModBase&>(*state.engine).itsAlphaLUT;

@@ -1,4 +1,4 @@
-// OriginalComponents: a state's components as create_state made them, and whether somebody has changed them since.
+// OriginalComponents: a state's components as create_state made them, and whether they have changed since.
 #ifndef MORVIK_SRC_ORIGINALCOMPONENTS_H
 #define MORVIK_SRC_ORIGINALCOMPONENTS_H
 
@@ -9,16 +9,16 @@
 #include "DecoderState.h"
 #include "TDecoder3GPU.h"
 
-/// A test bench may put other components into a state, or change what they hold. The state then no longer decodes as
-/// its generics say.
+/// Detects whether a test bench has replaced a state's components or changed their members. The state then no longer
+/// decodes as its generics say.
 class OriginalComponents {
 public:
     using State = veltra_ip_morvik_v1_0_state;
 
-    /// Of a state whose components have just been made.
+    /// Records a state whose components have just been created.
     explicit OriginalComponents(const State& state);
 
-    /// May be used while the state still has it.
+    /// Valid while the state still holds it.
     TDecoder3GPU& decoder()
     {
         return itsDecoder;
@@ -29,20 +29,19 @@ public:
         return itsGenerics;
     }
 
-    /// Whether the state's components are still these, and hold the same. Cheap: it is asked for each block. The
-    /// tables that decoder and interleaver keep for a block size are not looked at; of a correction table, the
-    /// entries of differences below 64 steps are, beyond which the hardware's has no corrections.
+    /// Whether the state still holds these components, unchanged. Cheap, since it is called for each block: skips the
+    /// tables that decoder and interleaver cache for a block size, and checks correction tables only for differences
+    /// below 64 steps, beyond which the hardware has no corrections.
     bool areIn(const State& state) const;
 
-    /// Drops the tables that decoder and interleaver keep for another block size: a decode of K bits replaces them.
-    /// The state must have these components, for this and the next.
+    /// Drops the tables that decoder and interleaver cache for other block sizes, which a decode of K bits would
+    /// replace. This and the next function require the state to hold these components.
     void dropTablesOfOtherSizes(unsigned K);
 
-    /// Whether the tables for K bits, where there are any, are the components' own: they would use a test bench's.
+    /// Whether the cached tables for K bits, if any, are the components' own, not a test bench's, which they would use.
     bool haveOwnTables(unsigned K);
 
-    /// The decoder of a second set of such components, which nobody changes, counts in or watches. Exhausted memory
-    /// throws std::bad_alloc.
+    /// Returns the decoder of a second, private set of such components, created on first use. Throws std::bad_alloc.
     TDecoder3GPU& twin();
 
 private:
@@ -54,7 +53,7 @@ private:
     const veltra_ip_morvik_v1_0_generics itsGenerics;
     const std::vector<std::uint64_t> itsValues;
     const std::vector<unsigned char> itsCorrections;
-    std::unique_ptr<State, Release> itsTwin;  ///< once it was needed
+    std::unique_ptr<State, Release> itsTwin;  ///< null until needed
 };
 
 #endif

@@ -1,11 +1,11 @@
-// PathChoice: which of its two paths the next blocks of a state take.
+// PathChoice: selects the path, lanes or components, of a state's next blocks.
 #include "PathChoice.h"
 
 #include <typeinfo>
 
 namespace {
 
-/// Whether somebody traces or presets values that the lanes do not have.
+/// Whether a test bench traces or presets values that the lanes do not have.
 bool isWatched(const TDecoder& decoder)
 {
     return decoder.itsDumpCount != 0 || decoder.itsTraceLevel != 0 || !decoder.itsExtrinsicIn.empty();
@@ -42,7 +42,7 @@ void PathChoice::catchUp()
     itsMissedBlocks.computeColumns();
 }
 
-/// A decoder that a test bench has put in since, be it in the same place, has decoded nothing of what the lanes have.
+/// A decoder put in by a test bench since, even at the same address, has not decoded the lanes' blocks.
 void PathChoice::forgetBlocksOfOthers()
 {
     if (itsState.decoder != &itsOriginals.decoder() || typeid(*itsState.decoder) != typeid(TDecoder3GPU) ||

@@ -1,4 +1,4 @@
-// PathChoice: which of its two paths the next blocks of a state take.
+// PathChoice: selects the path, lanes or components, of a state's next blocks.
 #ifndef MORVIK_SRC_PATHCHOICE_H
 #define MORVIK_SRC_PATHCHOICE_H
 
@@ -10,17 +10,17 @@ class PathChoice {
 public:
     using State = veltra_ip_morvik_v1_0_state;
 
-    /// For a state whose components have just been made; it must outlive this.
+    /// Requires a state whose components have just been created and that outlives this object.
     PathChoice(State& state, const morvik::lanes::InstructionSet& instructionSet);
 
-    /// The lanes, ready for blocks of K bits; null where the components have to decode: somebody watches them, has
-    /// changed them or asks for them, or K is no block size. Exhausted memory throws std::bad_alloc.
+    /// Returns the lanes, ready for blocks of K bits; null if the components must decode: they are traced, changed or
+    /// requested, or K is not a block size. Throws std::bad_alloc.
     LanePath* lanesFor(unsigned K);
 
-    /// Makes the decoder's metric columns what they would be had it decoded every block itself.
+    /// Sets the decoder's metric columns as if it had decoded every block itself.
     void catchUp();
 
-    /// What the lanes run on; null while the components are asked for or changed.
+    /// The instruction set of the lanes; null while the components are requested or changed.
     const morvik::lanes::InstructionSet* instructionSet() const;
     void useLanes(const morvik::lanes::InstructionSet& instructionSet);
     void useComponents();

@@ -1,4 +1,4 @@
-// SimulationCall: the journey of a call's blocks: checked, sent on one of the two paths, delivered.
+// SimulationCall: checks a call, decodes its blocks on one of the two paths and delivers the results.
 #include "SimulationCall.h"
 
 #include <algorithm>
@@ -17,7 +17,7 @@ namespace {
 using State = veltra_ip_morvik_v1_0_state;
 using Outputs = veltra_ip_morvik_v1_0_batch_outputs;
 
-/// What is wrong with an output record, or null.
+/// Returns what is wrong with an output record, or null.
 const char* outputFault(const Outputs* outputs)
 {
     if (outputs == nullptr) {
@@ -26,7 +26,7 @@ const char* outputFault(const Outputs* outputs)
     return outputs->dout == nullptr ? "Simulate called with null pointer for dout" : nullptr;
 }
 
-/// What is wrong with where the counts go, or null.
+/// Returns what is wrong with the arrays for the counts, or null.
 const char* outputFault(const ErrorCounts& counts, const Batch& batch)
 {
     if (counts.sent == nullptr) {
@@ -53,7 +53,7 @@ const char* nullStream(const Batch& batch)
     return std::visit(nullOne, batch.streams);
 }
 
-/// What is wrong with the arguments of a call, the first of all, or null.
+/// Returns the first fault of a call's arguments, or null.
 const char* checkArguments(const State* state, const char* outputFault, const Batch& batch)
 {
     if (state == nullptr) {
@@ -72,7 +72,7 @@ const char* checkArguments(const State* state, const char* outputFault, const Ba
                                                          : nullptr;
 }
 
-/// Which array of the record has no room for all that a batch of blocks of K bits delivers, or null.
+/// Returns which array of the record is too short for a batch of blocks of K bits, or null.
 const char* shortArray(const Outputs& outputs, std::size_t blocks, std::size_t K)
 {
     const auto lacks = [blocks](std::size_t room, std::size_t each) {
@@ -88,8 +88,8 @@ const char* shortArray(const Outputs& outputs, std::size_t blocks, std::size_t K
                                                                    : nullptr;
 }
 
-/// Lets a path take in the blocks of a batch, some at a time, and calls decode(path, first, taken) after each time.
-/// `firstAlone`: the first time it takes one block.
+/// Feeds the blocks of a batch to a path, some at a time, and calls decode(path, first, taken) each time.
+/// `firstAlone`: takes only one block the first time.
 template <class Decode>
 Status sendBy(BlockPath& path, const Batch& batch, bool firstAlone, Decode decode)
 {
@@ -103,8 +103,8 @@ Status sendBy(BlockPath& path, const Batch& batch, bool firstAlone, Decode decod
     return success;
 }
 
-/// Sends a batch through the lanes where they can decode it, else through the components, which guard the decoder
-/// alone.
+/// Sends a batch through the lanes if they can decode it, else through the components, which guard only the decoder
+/// call.
 template <class Decode>
 Status send(State& state, const Batch& batch, bool firstAlone, Decode decode)
 {
@@ -122,7 +122,7 @@ Status send(State& state, const Batch& batch, bool firstAlone, Decode decode)
     return sendBy(components, batch, firstAlone, decode);
 }
 
-/// Delivers what a path gives for the blocks from `first` on.
+/// Delivers a path's results for the blocks from `first` on.
 void deliver(State& state, const Batch& batch, BlockPath& path, std::size_t first, unsigned taken, Outputs& outputs)
 {
     const std::size_t K = path.blockSize();
@@ -143,7 +143,7 @@ void deliver(State& state, const Batch& batch, BlockPath& path, std::size_t firs
 
 }  // namespace
 
-/// Room is checked last: where it lacks, the first block is decoded, and counted, before all are refused.
+/// Checks array sizes last: if one is too short, the first block is decoded, and counted, before the call is refused.
 Status simulate(State* state, const Batch& batch, Outputs* outputs)
 {
     if (const char* reason = checkArguments(state, outputFault(outputs), batch)) {

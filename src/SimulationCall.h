@@ -1,4 +1,4 @@
-// SimulationCall: the journey of a call's blocks: checked, sent on one of the two paths, delivered.
+// SimulationCall: checks a call, decodes its blocks on one of the two paths and delivers the results.
 #ifndef MORVIK_SRC_SIMULATIONCALL_H
 #define MORVIK_SRC_SIMULATIONCALL_H
 
@@ -12,15 +12,15 @@
 
 namespace morvik::simulation_call {
 
-/// What was sent, and where the counts of wrong decisions go.
+/// The sent bits, and the output array for the counts of wrong decisions.
 struct ErrorCounts {
     const std::uint8_t* sent;
     std::uint32_t* errors;
     std::size_t room;
 };
 
-/// Every call of the C headers comes here. Exhausted memory becomes a status, but for that of the components' soft
-/// values, which are built before the decoder is called: it leaves as an exception.
+/// All simulation calls of the C headers end up here. Exhausted memory becomes a status, except while the components'
+/// soft values are built, before the decoder is called: it then throws.
 Status simulate(veltra_ip_morvik_v1_0_state* state, const Batch& batch, veltra_ip_morvik_v1_0_batch_outputs* outputs);
 Status countErrors(veltra_ip_morvik_v1_0_state* state, const Batch& batch, const ErrorCounts& counts);
 

@@ -1,4 +1,4 @@
-// Status: how a call of the C interface ends, and its line when it is refused.
+// Status: the return codes of the C interface, and the error line of a refused call.
 #include "Status.h"
 
 #include "Messages.h"

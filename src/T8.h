@@ -3,8 +3,8 @@
 #define MORVIK_SRC_T8_H
 
 /// One column of the trellis: element s belongs to trellis state s, 0 to 7. A column of branch
-/// metrics uses the elements 0 to 3 and leaves 4 to 7 as they were. Arrays of columns are
-/// contiguous, one column for each trellis step.
+/// metrics uses elements 0 to 3 and leaves 4 to 7 unchanged. Arrays of columns are contiguous, one
+/// column for each trellis step.
 struct T8 {
     short metric[8];
 

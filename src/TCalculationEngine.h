@@ -9,15 +9,14 @@
 #include "TNumberFormat.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
-/// An engine computes the four steps of a soft-in/soft-out pass over a stretch of the trellis.
+/// Computes the four kernels of a soft-in/soft-out pass over a range of trellis steps.
 ///
-/// Order of use: create, set the three formats, `initialise`, then kernels in any order. The
+/// Order of use: create, set the three formats, `initialise`, then call kernels in any order. The
 /// formats are not owned and must outlive the engine. All values are left-aligned 16-bit words of
-/// the state format; a kernel returns a pointer past the stretch it worked on, or null when it
-/// cannot run.
+/// the state format. A kernel returns a pointer past its range, or null if it cannot run.
 class MORVIK_API TCalculationEngine {
 public:
-    bool itsUseSSE2 = false;  ///< asks for SSE2 kernels; this engine has none, so its kernels return null
+    bool itsUseSSE2 = false;  ///< requests SSE2 kernels; there are none, so the kernels return null
     const TNumberFormat* itsInputFormat = nullptr;   ///< channel soft values
     const TNumberFormat* itsStateFormat = nullptr;   ///< state metrics
     const TNumberFormat* itsBranchFormat = nullptr;  ///< branch metrics
@@ -27,9 +26,9 @@ public:
     /// The type name and properties in property-string form.
     virtual std::string getProperties() const = 0;
 
-    /// Makes the engine ready once its formats are set; false means that it cannot be used. The
-    /// base returns true, and warns on the standard output stream when the state format has more
-    /// than 16 bits, so that its mask is empty.
+    /// Prepares the engine once its formats are set; returns false if it cannot be used. The base
+    /// returns true, and warns on standard output if the state format has more than 16 bits, which
+    /// leaves its mask empty.
     virtual bool initialise();
 
     /// Branch metrics: g[k], elements 0 to 3, from intrinsic[k], parity0[k] and parity1[k], for
@@ -48,12 +47,12 @@ public:
     /// bit 1. Returns out + n.
     virtual short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) = 0;
 
-    /// Makes an engine from a property string: "MOD", or "MOD#" with an optional ":" and number of
-    /// table points. Null after one line on the standard error stream when the text is another.
-    /// The caller deletes the engine.
+    /// Creates an engine from a property string: "MOD", or "MOD#" with an optional ":" and number of
+    /// table points. Returns null, after one line on standard error, for any other text. The caller
+    /// deletes the engine.
     static TCalculationEngine* create(const std::string& s);
 
-    /// The type names that are announced: "MOD" alone.
+    /// The announced type names: only "MOD".
     static std::vector<std::string> getNames();
 
 protected:

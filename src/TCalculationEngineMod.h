@@ -6,11 +6,11 @@
 
 #include "TCalculationEngineModBase.h"
 
-/// The engine that decides for the greater candidate and corrects nothing.
+/// Decides for the greater candidate, without correction.
 class MORVIK_API TCalculationEngineMod : public TCalculationEngineModBase {
 public:
-    /// Makes the engine; the properties must be empty, else null after one line on the standard
-    /// error stream. The caller deletes it.
+    /// Creates the engine. Returns null, after one line on standard error, unless the properties are
+    /// empty. The caller deletes it.
     static TCalculationEngine* create(const std::string& p);
 
     std::string getProperties() const override;

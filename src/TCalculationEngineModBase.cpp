@@ -22,7 +22,7 @@ using morvik::rules::wrap16;
 using BranchMetrics = rules::BranchMetrics<Value>;
 using StateMetrics = std::array<Value, rules::stateCount>;
 
-/// The corrections of an engine's table, called with a decision difference.
+/// Looks up the correction of a decision difference in an engine's table.
 struct Corrections {
     const unsigned char* anchor;
 
@@ -95,7 +95,7 @@ short* ratios(const Decision& rule, unsigned n, const T8* a, const T8* b, const 
     return out + n;
 }
 
-/// Runs the variant of a kernel, "MOD", "MOD*" or "MOD#", that the engine's algorithm type asks for.
+/// Runs the variant of a kernel, "MOD", "MOD*" or "MOD#", that the algorithm type selects.
 template <class Result, class... Arguments>
 Result* runVariant(const TCalculationEngineModBase& engine,
                    TCalculationEngineModBase::AlgorithmType type,
@@ -284,7 +284,7 @@ std::istream& operator>>(std::istream& is, TCalculationEngineModBase::AlgorithmT
     if (next == '*' || next == '#') {
         is.get();
         type = next == '*' ? TCalculationEngineModBase::MOD_STAR : TCalculationEngineModBase::MOD_HASH;
-    } else if (next <= ' ' || next == ':') {  // the end of the input counts as -1
+    } else if (next <= ' ' || next == ':') {  // the end of the input is -1
         type = TCalculationEngineModBase::MOD;
     }
     return is;

@@ -1,4 +1,4 @@
-// TDecoder: the family of turbo decoders, what they all store, and their factory.
+// TDecoder: the base class of turbo decoders, their common data and their factory.
 #include "TDecoder.h"
 
 #include <algorithm>
@@ -12,7 +12,7 @@
 
 namespace {
 
-/// Columns are aligned to their own size, 16 bytes, so that each lies in one cache line.
+/// Aligns columns to their own size, 16 bytes, so that each lies in one cache line.
 unsigned char* alignColumn(unsigned char* address)
 {
     const auto misalignment = reinterpret_cast<std::uintptr_t>(address) % sizeof(T8);

@@ -79,7 +79,7 @@ bool TDecoder3G::decode(const std::vector<short>& soft,
             return false;
         }
         const unsigned long long errors = countBitErrors(reference, hardDecisions());
-        std::fill(itsLLR.end() - tailSteps, itsLLR.end(), short{0});  // the tail ratios decide nothing
+        std::fill(itsLLR.end() - tailSteps, itsLLR.end(), short{0});  // the tail's ratios give no decision
         bitErrors[iteration] += errors;
         blockErrors[iteration] += errors != 0 ? 1U : 0U;
     }
@@ -160,7 +160,7 @@ bool TDecoder3G::interleaveSystematic(unsigned K)
 bool TDecoder3G::preparePermutation(unsigned d, unsigned K) const
 {
     if (K == 0) {
-        return true;  // a block of no bits needs none
+        return true;  // an empty block needs no table
     }
     std::vector<unsigned>& table = permutation(d);
     if (table.size() != K && d == 1) {
@@ -213,7 +213,7 @@ bool TDecoder3G::calcIntrinsic(unsigned int h)
     const std::vector<unsigned>& from = permutation(d);
     const int mask = itsEngine->itsStateFormat->itsMask;
     for (unsigned j = 0; j < itsBlockSize; ++j) {
-        const int apriori = j < K ? itsExtrinsic[from[j]] : 0;  // nothing is known beforehand of tail bits
+        const int apriori = j < K ? itsExtrinsic[from[j]] : 0;  // tail bits have no a-priori value
         itsIntrinsic[j] = rules::intrinsicValue(apriori, itsSys[d][j], mask);
     }
     return true;

@@ -11,8 +11,8 @@
 
 /// Separates the input streams, runs the half-iterations of the two constituent decoders in turn
 /// and makes the hard decisions. Constituent decoder 0 works in natural order, 1 in interleaved
-/// order. Even half-iterations belong to decoder 1, odd ones to decoder 0, so that every decode
-/// ends in natural order.
+/// order. Even half-iterations belong to decoder 1, odd ones to decoder 0, so every decode ends in
+/// natural order.
 ///
 /// Input layouts: LTE, 3 K + 12 values, one parity stream for each decoder; and 3GPP2, 5 K + 18
 /// values, two parity streams for each. Values are aligned words of the state format.
@@ -23,8 +23,8 @@ public:
     std::array<std::vector<short>, 2> itsPar1;  ///< second parity values, K + 3; zeros in the LTE layout
     const bool is3GPP2;                         ///< the input layout
 
-    /// Makes the decoder; the properties must be empty, else null after one line on the standard
-    /// error stream. The caller deletes it.
+    /// Creates the decoder. Returns null, after one line on standard error, unless the properties are
+    /// empty. The caller deletes it.
     static TDecoder* create(bool layout3GPP2, const std::string& properties);
 
     bool allocate(unsigned int blockSize) override;
@@ -32,8 +32,7 @@ public:
     /// "3GPP2" or "3GPP".
     std::string getProperties() const override;
 
-    /// Counts the errors after each iteration: entry t of bitErrors and blockErrors counts those
-    /// that are left after iteration t.
+    /// Adds the errors left after iteration t to entry t of bitErrors and blockErrors.
     bool decode(const std::vector<short>& soft,
                 const std::vector<unsigned char>& reference,
                 std::vector<unsigned long long>& bitErrors,
@@ -48,8 +47,8 @@ public:
     /// ratio and extrinsic value, as real numbers.
     void dumpFull(std::ostream& out, unsigned int halfIteration) override;
 
-    /// The steps of a decode, in order of use; h is the half-iteration. Each returns false when the
-    /// decode is to end.
+    /// The steps of a decode, in order of use; h is the half-iteration. Each returns false if the
+    /// decode must end.
     virtual bool extract(const std::vector<short>& soft);
     virtual bool calcIntrinsic(unsigned int h);
     virtual bool calcGamma(unsigned int h);
@@ -62,36 +61,36 @@ public:
 protected:
     explicit TDecoder3G(bool layout3GPP2);
 
-    /// The constituent decoder that half-iteration h belongs to.
+    /// The constituent decoder of half-iteration h.
     static unsigned constituent(unsigned int h)
     {
         return morvik::rules::constituentOf(h);
     }
 
-    /// One kernel over the trellis steps j to k; backward from j down to k. The start column of a
-    /// recursion, at step j, must be in place.
+    /// Runs one kernel over the trellis steps j to k, the backward recursion from j down to k. The
+    /// start column of a recursion, at step j, must be set.
     bool calcGamma(unsigned int h, unsigned int j, unsigned int k);
     bool calcAlpha(unsigned int h, unsigned int j, unsigned int k);
     bool calcBeta(unsigned int h, unsigned int j, unsigned int k);
     bool calcLLR(unsigned int h, unsigned int j, unsigned int k);
 
-    /// The column of an encoder known to be in state 0: 0 for state 0, half the most negative
+    /// Sets the column of an encoder known to be in state 0: 0 for state 0, half the most negative
     /// metric for the others (rule 10).
     void setInitialState(T8* column) const;
 
-    /// The column that favours no state: zeros (rule 10).
+    /// Sets the column of an unknown state: zeros (rule 10).
     static void setUnknownState(T8* column);
 
 private:
     using InputPosition = std::vector<short>::const_iterator;
 
-    /// Takes the parity values of one trellis step of constituent decoder d from the input.
+    /// Reads the parity values of one trellis step of constituent decoder d from the input.
     void appendParity(unsigned d, InputPosition& next);
     bool interleaveSystematic(unsigned K);
-    /// Brings the table by which constituent decoder d reads extrinsic values to K entries.
+    /// Computes the table by which constituent decoder d reads extrinsic values, unless it has K entries.
     bool preparePermutation(unsigned d, unsigned K) const;
     std::vector<unsigned>& permutation(unsigned d) const;
-    /// The extrinsic values with which a decode starts: the preset ones, or zeros.
+    /// Sets the extrinsic values that a decode starts from: the preset ones, or zeros.
     bool startExtrinsic();
     std::vector<unsigned char> hardDecisions() const;
     void dumpInput() const;

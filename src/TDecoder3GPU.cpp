@@ -21,7 +21,7 @@ constexpr std::uint32_t defaultUnits = 4;
 constexpr std::uint32_t traceSegments = 1;  ///< above this level, the segmentation is traced
 constexpr std::uint32_t traceColumns = 8;   ///< above this level, every border column is traced
 
-/// A column as it is kept at a border between segments or windows (rule 11).
+/// Returns a column as stored at a border between segments or windows (rule 11).
 T8 border(const T8& column)
 {
     T8 kept{};
@@ -31,7 +31,7 @@ T8 border(const T8& column)
     return kept;
 }
 
-/// Reads one of the decoder's numbers; false, after an error line, when it is missing or 0.
+/// Reads one of the decoder's numbers. Returns false, after an error line, if it is missing or 0.
 bool readNumber(std::istream& text, const char* what, std::uint32_t& number)
 {
     text >> number;
@@ -56,7 +56,7 @@ std::string text(const std::vector<TDecoder3GPU::ABSegment>& segments)
 {
     std::ostringstream list;
     list.imbue(std::locale::classic());
-    list.exceptions(std::ios::badbit);  // exhausted memory must not cost a segment unnoticed
+    list.exceptions(std::ios::badbit);  // exhausted memory throws instead of losing a segment silently
     const char* separator = "";
     for (const TDecoder3GPU::ABSegment& segment : segments) {
         list << separator << segment;
@@ -110,7 +110,7 @@ bool TDecoder3GPU::allocate(unsigned int blockSize)
     if (!TDecoder3G::allocate(blockSize)) {
         return false;
     }
-    // The last segment's end tells for which K the segments were cut; none are left by a refused size.
+    // The last segment's end is the K of the cut; a refused size leaves no segments.
     const std::uint32_t K = blockSize - tailSteps;
     if ((itsAlphaSegment.empty() || itsAlphaSegment.back().to != K) && !buildSegments(K)) {
         return false;
@@ -155,7 +155,7 @@ bool TDecoder3GPU::buildSegments(std::uint32_t K)
 
 bool TDecoder3GPU::calcGamma(unsigned int h)
 {
-    // The tail steps are left out. For a block of no bits the range is empty: 0 to -1, modulo 2^32.
+    // Without the tail steps. For an empty block the range is empty: 0 to -1, modulo 2^32.
     return calcGamma(h, 0, itsBlockSize - tailSteps - 1);
 }
 
@@ -216,8 +216,8 @@ bool TDecoder3GPU::calcBeta(unsigned int h)
     if (rules::isFirstPass(h)) {
         initialiseBeta(h);
     }
-    // The units hold one start column for each segment and fetch the next row's while they work on
-    // this one's: before the recursion of a window, not after it.
+    // The units hold one start column for each segment, and fetch the next row's before they run the
+    // recursion of this row's window, not after.
     std::vector<T8> row = starts;
     row.resize(itsNT);
     for (std::size_t i = 0; i < starts.size(); ++i) {
@@ -268,7 +268,7 @@ bool TDecoder3GPU::runWindow(unsigned int h, std::size_t i, const T8& start)
                                     text(reached));
     }
     if (i == 0) {
-        return true;  // the block's first window ends at its own first step: nobody starts from there
+        return true;  // no window starts where the block's first one ends
     }
     const std::size_t entry = windowStartingWhereEnds(i);
     T8& stored = itsBetaInit[constituent(h)][entry];

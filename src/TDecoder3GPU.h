@@ -11,16 +11,16 @@
 
 #include "TDecoder3G.h"
 
-/// Splits the block into segments, which the processing units' threads work on at the same time,
-/// and each segment into windows for the backward recursion. A recursion starts from the border
-/// column that its neighbour reached: in the last pass of the same constituent decoder, or, where
-/// the hardware's order makes it available, in this one. The threads are pipeline contexts of the
-/// hardware; here they are computed one after the other.
+/// Splits the block into segments, which the processing units' threads compute in parallel, and each
+/// segment into windows for the backward recursion. A recursion starts from the border column that
+/// its neighbour reached: in the last pass of the same constituent decoder, or in this one if the
+/// hardware's order makes it available. The threads are pipeline contexts of the hardware; the model
+/// computes them one after the other.
 class MORVIK_API TDecoder3GPU : public TDecoder3G {
 public:
-    /// Trellis steps: of a segment the first and the one after the last; of a window the last and
-    /// the one before the first, where the backward recursion ends. The block's first window ends at
-    /// its own first step, 0.
+    /// A range of trellis steps. Segment: its first step, and the one after its last. Window: its last
+    /// step, and the one before its first, where the backward recursion ends; the block's first window
+    /// ends at its own first step, 0.
     struct ABSegment {
         std::uint32_t from;
         std::uint32_t to;
@@ -34,19 +34,19 @@ public:
     std::array<std::vector<T8>, 2> itsBetaInit;   ///< backward start columns, one for each window
     std::vector<ABSegment> itsBetaSegment;        ///< the windows, row by row: one window of each segment
 
-    /// Makes the decoder from "", "P" or "P,T": P processing units with T threads each, 4 when left
-    /// out, both 1 or more. Null after one line on the standard error stream when the text is
-    /// another. The caller deletes it.
+    /// Creates the decoder from "", "P" or "P,T": P processing units with T threads each, both 1 or
+    /// more, 4 by default. Returns null, after one line on standard error, for any other text. The
+    /// caller deletes it.
     static TDecoder* create(bool layout3GPP2, const std::string& properties);
 
-    /// "3GPPPU:P" or "3GPP2PU:P", with ",T" behind it when T is not 4.
+    /// "3GPPPU:P" or "3GPP2PU:P", followed by ",T" if T is not 4.
     std::string getProperties() const override;
 
-    /// Cuts the block into segments and windows and clears the border columns. False, after one
-    /// line on the standard error stream, when K does not divide into the segments.
+    /// Cuts the block into segments and windows and clears the border columns. Returns false, after
+    /// one line on standard error, if K is not divisible by the number of segments.
     bool allocate(unsigned int blockSize) override;
 
-    /// The passes, split. The tail enters through the last window's start column alone.
+    /// The kernels, split into segments or windows. The tail enters only through the last window's start column.
     bool calcGamma(unsigned int h) override;
     bool calcAlpha(unsigned int h) override;
     bool calcBeta(unsigned int h) override;
@@ -58,11 +58,11 @@ protected:
     using TDecoder3G::calcBeta;
     using TDecoder3G::calcGamma;
 
-    /// The start column of segment or window i when nothing is known of it: all states alike.
+    /// Sets the start column of segment or window i to the unknown state: all states alike.
     static bool preCalcAlpha(unsigned int h, unsigned int i, T8* column);
     static bool preCalcBeta(unsigned int h, unsigned int i, T8* column);
 
-    /// The backward metrics at step K, in closed form from the three tail steps (rule 12).
+    /// Computes the backward metrics at step K in closed form from the three tail steps (rule 12).
     bool preCalcBetaTail(unsigned int h, T8* column) const;
 
 private:

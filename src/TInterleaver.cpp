@@ -1,4 +1,4 @@
-// TInterleaver: the family of interleavers, its permutation tables and its factory.
+// TInterleaver: the base class of interleavers, its permutation tables and its factory.
 #include "TInterleaver.h"
 
 #include <cstddef>
@@ -64,7 +64,7 @@ void TInterleaver::dumpAll(unsigned first, unsigned last, bool showSize)
             }
             os.put('\n');
         }
-        if (K == last) {  // tested here, so that a `last` of 2^32 - 1 ends the loop
+        if (K == last) {  // tested here so that the loop ends for a `last` of 2^32 - 1
             return;
         }
     }

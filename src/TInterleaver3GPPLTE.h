@@ -8,11 +8,11 @@
 /// sizes of 3GPP TS 36.212, Table 5.1.3-3.
 class MORVIK_API TInterleaver3GPPLTE : public TInterleaver {
 public:
-    /// Makes the interleaver; `props` must be empty, else null after one line on the standard error
-    /// stream. The caller deletes it.
+    /// Creates the interleaver. Returns null, after one line on standard error, unless `props` is
+    /// empty. The caller deletes it.
     static TInterleaver* create(const std::string& props);
 
-    /// Reserves room for K entries before it looks K up: an absurd K throws std::length_error or
+    /// Reserves K entries before it looks K up, so an absurd K throws std::length_error or
     /// std::bad_alloc.
     bool calcInterleaver(std::vector<unsigned>& out, unsigned K) const override;
 

@@ -7,7 +7,7 @@
 TraceRow::TraceRow(const TNumberFormat& format) : itsFormat(format)
 {
     itsText.imbue(std::locale::classic());
-    itsText.exceptions(std::ios::badbit);  // exhausted memory must not cost a row unnoticed
+    itsText.exceptions(std::ios::badbit);  // exhausted memory throws instead of losing a row silently
     itsText << std::left << std::showpos << std::fixed << std::setprecision(6);
 }
 

@@ -1,4 +1,4 @@
-// TraceTable: rows of a trace, one for each trellis step.
+// TraceTable: the rows of a trace, one for each trellis step.
 #ifndef MORVIK_SRC_TRACETABLE_H
 #define MORVIK_SRC_TRACETABLE_H
 
@@ -7,8 +7,8 @@
 #include "T8.h"
 #include "TNumberFormat.h"
 
-/// Composes a row and writes it. Steps take a field of 5 characters, values one of 12, both
-/// left-aligned; a value is a real number with a sign and 6 decimals.
+/// Composes a row and writes it. The step's field is 5 characters wide, those of values 12, both
+/// left-aligned; values are real numbers with a sign and 6 decimals.
 class TraceRow {
 public:
     explicit TraceRow(const TNumberFormat& format);
@@ -21,13 +21,13 @@ public:
     /// Elements first to last of a column.
     void values(const T8& column, unsigned first, unsigned last);
 
-    /// A value with a mark before it: "*" when `other`, which it is compared with, differs.
+    /// A value, preceded by "*" if it differs from `other`.
     void compared(short aligned, short other);
 
-    /// Elements first to last of a column, each compared with the same element of another.
+    /// Elements first to last of a column, each compared with that of another column.
     void compared(const T8& column, const T8& other, unsigned first, unsigned last);
 
-    /// Two blanks between groups of values.
+    /// Adds two blanks, between groups of values.
     void gap();
 
     /// Writes the row and a newline.

@@ -1,4 +1,4 @@
-// morvik_v1_0_batch: the batch interface, and the choice of how a state computes.
+// morvik_v1_0_batch: the batch interface, and the choice of a state's instruction set.
 #include "morvik_v1_0_batch.h"
 
 #include <string>

@@ -16,7 +16,7 @@ using Generics = veltra_ip_morvik_v1_0_generics;
 using namespace morvik::simulation_call;
 using State = veltra_ip_morvik_v1_0_state;
 
-/// What is wrong with the generics, or null.
+/// Returns what is wrong with the generics, or null.
 const char* checkGenerics(const Generics& generics)
 {
     if (generics.C_NUM_PU != 2 && generics.C_NUM_PU != 4 && generics.C_NUM_PU != 8) {
@@ -43,7 +43,7 @@ const char* checkGenerics(const Generics& generics)
     return nullptr;
 }
 
-/// Builds what a state consists of; null, or what failed.
+/// Builds a state's components and path choice. Returns null, or what failed.
 const char* build(State& state)
 {
     if (const char* reason = morvik::components::create(state)) {
@@ -81,7 +81,7 @@ veltra_ip_morvik_v1_0_state* create_default_state(veltra_ip_morvik_v1_0_generics
     }
     *state = State{};
     state->generics = generics;
-    // The shift count has five bits: a width of 32 keeps no bit, as a width of 0.
+    // The shift count has five bits: like a width of 0, a width of 32 keeps no bit.
     state->tag_mask = morvik::rules::tagMask(static_cast<std::uint32_t>(generics.C_TAG_WIDTH));
     return state;
 }
