@@ -1,9 +1,9 @@
-// Bounds: how far apart metrics can lie, and what the lanes may therefore leave out.
+// Bounds: the bounds on metric differences, and the simplifications that they allow.
 //
-// All metrics are in eighths. The hardware's registers wrap at 4096, so comparisons by the wrapped difference and plain
-// comparisons agree while true differences stay within -2048 ... 2047. Branch metrics are clipped to -128 ... 127, and
-// any state is reached from any other in three steps, over a branch pair that shares its metric in the last one. Bounds
-// follow for each step (lane_bounds_test computes them):
+// All metrics are in eighths. The hardware's registers wrap at 4096, so wrapped and plain comparisons agree while true
+// differences stay within -2048 ... 2047. Branch metrics are clipped to -128 ... 127, and any state can be reached from
+// any other in three steps, the last of them over a branch pair that shares its metric. This bounds each step
+// (lane_bounds_test computes the bounds):
 //
 //   between two states of a column             within 786; 1228 in the three steps after a known start,
 //                                              1287 in the tail's column, 670 in a kept border column
@@ -11,12 +11,12 @@
 //   between two branches in a ratio's tree     within 1340, near the ends of a block 1898
 //   a ratio                                    within 944
 //
-// They include the corrections of MOD#, at most 6 for each decision. So plain maxima decide everywhere.
+// They include the corrections of MOD#, at most 6 for each decision. So plain maxima suffice everywhere.
 //
-// In the 64 steps of a window a metric grows by 64 (128 + 6) at most. A column that starts within 1300 of 0 stays
-// within 9900, and the sum of a forward and a backward one within 20000: no 16-bit word overflows in a window. Between
-// windows, columns are brought back to 0 by multiples of 8: a border column loses its three low bits (rule 11), and
-// clearing them commutes with such a shift.
+// In the 64 steps of a window a metric grows by at most 64 (128 + 6). A column that starts within 1300 of 0 stays
+// within 9900, and the sum of a forward and a backward metric within 20000: no 16-bit word overflows within a window.
+// Between windows, columns are normalised to about 0 by multiples of 8: a border column loses its three low bits
+// (rule 11), and clearing them commutes with such a shift.
 #ifndef MORVIK_LANES_BOUNDS_H
 #define MORVIK_LANES_BOUNDS_H
 
@@ -32,7 +32,7 @@ using rules::longestWindow;
 constexpr int branchMin = rules::smallestOf(rules::branchBits);
 constexpr int branchMax = rules::largestOf(rules::branchBits);
 
-/// Every state but 0 of a known start column.
+/// The metric of every state but 0 in a known start column.
 constexpr int unlikely = rules::knownMetric<int>(1, rules::smallestOf(rules::stateBits));
 
 /// The bits of a metric that a border column keeps.

@@ -1,4 +1,4 @@
-// InstructionSets: the compilations of the lanes, and which of them this machine can run.
+// InstructionSets: the compilations of the lanes, and those that this machine can run.
 #include "InstructionSets.h"
 
 namespace morvik::lanes {

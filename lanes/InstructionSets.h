@@ -1,4 +1,4 @@
-// InstructionSets: the compilations of the lanes, and which of them this machine can run.
+// InstructionSets: the compilations of the lanes, and those that this machine can run.
 #ifndef MORVIK_LANES_INSTRUCTIONSETS_H
 #define MORVIK_LANES_INSTRUCTIONSETS_H
 
@@ -8,13 +8,13 @@
 
 namespace morvik::lanes {
 
-/// Those that this machine can run, the best one first. The last one runs everywhere.
+/// Returns those that this machine can run, best first. The last one runs everywhere.
 std::vector<const InstructionSet*> availableInstructionSets();
 
-/// The best one.
+/// Returns the best one available.
 const InstructionSet& bestInstructionSet();
 
-/// The narrowest kernel that has room for all of `blocks` blocks of so many segments, or the widest one.
+/// Returns the narrowest kernel that holds `blocks` blocks of `segments` segments, or else the widest one.
 const Kernel& kernelFor(const InstructionSet& instructionSet, unsigned segments, unsigned blocks);
 
 }  // namespace morvik::lanes

@@ -41,7 +41,7 @@ struct KernelOf<Shape<count, vectors, mostAbreast>> {
         if (from == 0) {
             interleave(workspace);
         }
-        // Where the first two windows differ in length, no others are equal but by chance.
+        // If the first two windows differ in length, others are equal only by chance.
         const bool abreast = workspace.windows > 1 && workspace.windowStart[2] == 2 * workspace.windowStart[1];
         if (mostAbreast > 1 && abreast) {
             decodeAbreast<mostAbreast>(workspace, algorithm, from, to);
@@ -63,7 +63,7 @@ struct KernelOf<Shape<count, vectors, mostAbreast>> {
         }
     }
 
-    /// Decoder 1's systematic values are decoder 0's, in interleaved order.
+    /// Fills decoder 1's systematic values: decoder 0's in interleaved order.
     static void interleave(const Workspace& workspace)
     {
         const Constituent& to = workspace.constituent[1];
@@ -75,7 +75,7 @@ struct KernelOf<Shape<count, vectors, mostAbreast>> {
         }
     }
 
-    /// Even passes belong to decoder 1, odd ones to decoder 0 (rule 15). Pass 0 knows nothing beforehand.
+    /// Even passes belong to decoder 1, odd ones to decoder 0 (rule 15). Pass 0 has no a-priori values.
     template <template <unsigned> class RuleOf, unsigned abreast, Extrinsic extrinsic>
     static void runPasses(const Workspace& workspace, unsigned from, unsigned to)
     {
@@ -94,7 +94,7 @@ struct KernelOf<Shape<count, vectors, mostAbreast>> {
     }
 
     static constexpr unsigned slotBytes = Pass<Greatest, count, vectors, mostAbreast, Extrinsic::whole>::slotBytes;
-    /// Of the rule that keeps more, a pending correction with each metric.
+    /// For the larger rule, which keeps a pending correction with each metric.
     static constexpr unsigned forwardBytes = Pass<Corrected, count, vectors, 1, Extrinsic::whole>::forwardBytes;
 
     static constexpr Kernel kernel = {count * vectors,

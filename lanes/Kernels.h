@@ -1,4 +1,4 @@
-// Kernels: what each instruction set's compilation of the lanes offers to the rest of the library.
+// Kernels: the interface of each instruction set's compilation of the lanes.
 #ifndef MORVIK_LANES_KERNELS_H
 #define MORVIK_LANES_KERNELS_H
 
@@ -8,33 +8,33 @@
 
 namespace morvik::lanes {
 
-/// How decisions are made and extrinsic values scaled: the hardware's algorithm types, in their order.
+/// The hardware's algorithm types, in their order: the decisions and the scaling of extrinsic values.
 enum class Algorithm { greatest, greatestScaled, corrected };
 
-/// A decoder for slices of so many lanes.
+/// A decoder for slices of a given number of lanes.
 struct Kernel {
-    unsigned lanes;             ///< of a slice
-    unsigned vectorLanes;       ///< of a vector
-    unsigned groupLanes;        ///< of a group, whose lanes come from one group of a source slice (Machine.h)
-    unsigned sources;           ///< groups that a vector's permutation names
-    unsigned permutationBytes;  ///< that prepare writes for a vector
-    unsigned slotBytes;         ///< of one step of a window
-    unsigned forwardBytes;      ///< of the forward recursion's state
+    unsigned lanes;             ///< per slice
+    unsigned vectorLanes;       ///< per vector
+    unsigned groupLanes;        ///< per group; a group's lanes come from one group of a source slice (Machine.h)
+    unsigned sources;           ///< source groups of a vector's permutation
+    unsigned permutationBytes;  ///< written by prepare for a vector
+    unsigned slotBytes;         ///< for one step of a window
+    unsigned forwardBytes;      ///< for the forward recursion's state
 
-    /// Makes the control by which lane l of a vector is taken from lane source[l] of its source group.
+    /// Prepares the control that takes lane l of a vector from lane source[l] of its source group.
     void (*prepare)(const std::uint8_t* source, std::uint8_t* control);
 
-    /// Fills slices from an array of `steps` values for each lane. False when a value is beyond the input format:
-    /// then the low 24 bits of each of the caller's words have to be looked at.
+    /// Fills slices from an array of `steps` values for each lane. Returns false if a value is outside the input
+    /// format; the low 24 bits of each of the caller's words must then be checked.
     bool (*fillFromWords)(const std::int32_t* const* arrays, unsigned steps, std::int16_t* slices);
     bool (*fillFromHalfWords)(const std::int16_t* const* arrays, unsigned steps, std::int16_t* slices);
     bool (*fillFromBytes)(const std::int8_t* const* arrays, unsigned steps, std::int16_t* slices);
 
     /// Runs passes `from` to `to` - 1. Before pass 0, the systematic values of decoder 0, all parity values and start
-    /// columns must be in place. Leaves the ratios of the last pass, in its order.
+    /// columns must be set. Leaves the ratios of the last pass, in its order.
     void (*decode)(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to);
 
-    /// Spreads slices of ratios over an array for each lane, as decisions or as aligned words.
+    /// Writes slices of ratios to an array for each lane, as decisions or as aligned words.
     void (*spreadDecisions)(const std::int16_t* slices, unsigned steps, std::uint8_t* const* arrays);
     void (*spreadWords)(const std::int16_t* slices, unsigned steps, std::int16_t* const* arrays);
 };

@@ -1,4 +1,4 @@
-// LaneDecoder: decodes blocks of one size, one lane for each segment, several blocks at once.
+// LaneDecoder: decodes several blocks of one size at once, one lane for each segment.
 #include "LaneDecoder.h"
 
 #include <algorithm>
@@ -18,7 +18,7 @@ namespace {
 constexpr unsigned states = rules::stateCount;
 
 /// Bump allocator; a null base only measures. Arrays begin on cache lines, staggered so that equal steps of different
-/// arrays lie in different sets of the cache.
+/// arrays map to different cache sets.
 class Layout {
 public:
     static constexpr std::size_t line = 64;
@@ -160,8 +160,8 @@ std::size_t LaneDecoder::layOut(const Kernel& kernel, Work& work, unsigned char*
     return layout.size();
 }
 
-/// The interleaver is contention-free: it takes the values of one step of all segments from one step of all segments in
-/// the other order.
+/// The interleaver is contention-free: the values of one step of all segments come from one step of all segments in the
+/// other order.
 void LaneDecoder::prepareInterleaver(const Kernel& kernel,
                                      const SlicePermutations& permutations,
                                      const std::vector<unsigned>& from) const
@@ -176,8 +176,8 @@ void LaneDecoder::prepareInterleaver(const Kernel& kernel,
     std::fill_n(permutations.sources + permutations.count * vectors * kernel.sources, fetchAhead * kernel.sources, 0U);
 }
 
-/// The slice of a step takes its values from that of `sourceStep`, each segment from segment sourceOf(segment), modulo
-/// the number of segments.
+/// Prepares the slice of `step` to take its values from that of `sourceStep`, each segment from segment
+/// sourceOf(segment) modulo the number of segments.
 template <class SourceOf>
 void LaneDecoder::preparePermutation(const Kernel& kernel,
                                      const SlicePermutations& permutations,
@@ -223,7 +223,7 @@ bool LaneDecoder::load(const Streams<Input>* blocks, unsigned count)
     itsKernel = &kernel;
     itsCurrent = &work;
     itsBlocks = blocksTaken(count);
-    work.space.windowStart = itsWindowStart.data();  // of the cut as it is now
+    work.space.windowStart = itsWindowStart.data();  // of the current cut
     Constituent* const constituents = work.space.constituent;
     bool within = fillStream(blocks, &Streams<Input>::systematic, 0, constituents[0].systematic);
     within = fillStream(blocks, &Streams<Input>::parity1, 1, constituents[0].parity) && within;
@@ -256,7 +256,7 @@ bool LaneDecoder::fillStream(const Streams<Input>* blocks,
     return within;
 }
 
-/// Lanes without a block repeat the last one, which keeps their metrics within bounds.
+/// Lanes without a block repeat the last one, to keep their metrics within bounds.
 unsigned LaneDecoder::presentBlock(unsigned block) const
 {
     return std::min(block, itsBlocks - 1);
@@ -272,7 +272,7 @@ void LaneDecoder::decode(unsigned from, unsigned to)
     itsLastDecoder = rules::constituentOf(to - 1);
 }
 
-/// Before the first passes the state is known only at a block's ends (rules 10, 19, 20).
+/// Sets the start columns of the first passes: the state is known only at a block's ends (rules 10, 19, 20).
 void LaneDecoder::prepareStarts(unsigned d)
 {
     const Workspace& space = itsCurrent->space;

@@ -1,4 +1,4 @@
-// LaneDecoder: decodes blocks of one size, one lane for each segment, several blocks at once.
+// LaneDecoder: decodes several blocks of one size at once, one lane for each segment.
 #ifndef MORVIK_LANES_LANEDECODER_H
 #define MORVIK_LANES_LANEDECODER_H
 
@@ -18,7 +18,7 @@ namespace morvik::lanes {
 using rules::Cut;
 using rules::tailPositions;
 
-/// The caller's three streams of a block, K + 4 values each, at any addresses.
+/// The caller's three streams of a block, K + 4 values each, at any alignment.
 template <class Input>
 struct Streams {
     const Input* systematic;
@@ -26,27 +26,27 @@ struct Streams {
     const Input* parity2;
 };
 
-/// The three streams of a block as they were loaded.
+/// The three streams of a block as loaded.
 using LoadedBlock = std::array<std::vector<std::int16_t>, 3>;
 
-/// The correction table: eighths, by a quarter of the difference's magnitude in eighths; the last entry serves all
-/// greater ones, too.
+/// The correction table in eighths, indexed by a quarter of the difference's magnitude in eighths. The last entry also
+/// serves all greater magnitudes.
 using CorrectionTable = std::array<std::uint8_t, 16>;
 
-/// Permutations (Workspace.h) while they are prepared.
+/// Permutations (Workspace.h) under construction.
 struct SlicePermutations {
-    unsigned count;  ///< of slices
+    unsigned count;  ///< slices
     std::uint32_t* sources;
     std::uint8_t* controls;
 };
 
-/// Use: setCut whenever the size changes; then, for some blocks, load, decode and fetch results.
+/// Usage: setCut whenever the size changes; then repeatedly load blocks, decode and fetch the results.
 class LaneDecoder {
 public:
     LaneDecoder(const InstructionSet& instructionSet, Algorithm algorithm, const CorrectionTable& corrections);
 
-    /// Of a block size of the standard, at most 32 segments. One decoder cuts all blocks of a size alike: what was
-    /// prepared for a size is taken up again.
+    /// Requires a block size of the standard and at most 32 segments. A decoder must cut all blocks of a size alike: it
+    /// reuses what was prepared for a size.
     void setCut(const Cut& cut);
 
     const Cut& cut() const
@@ -59,42 +59,42 @@ public:
         return itsInstructionSet;
     }
 
-    /// How many blocks the next load takes when there are `blocks`, 1 or more.
+    /// Returns how many of `blocks` blocks, 1 or more, the next load takes.
     unsigned blocksTaken(unsigned blocks) const;
 
-    /// Takes as many blocks as blocksTaken says. False when a value is beyond the input format: clip the blocks and
-    /// load them again. Throws std::bad_alloc.
+    /// Loads blocksTaken(count) blocks. Returns false if a value is outside the input format: clip the blocks and load
+    /// them again. Throws std::bad_alloc.
     template <class Input>
     bool load(const Streams<Input>* blocks, unsigned count);
 
-    /// Runs passes `from` to `to` - 1 on the loaded blocks: 0 is the first one, later ones go on where the last call
-    /// ended.
+    /// Runs passes `from` to `to` - 1 on the loaded blocks. Pass 0 is the first; a later one continues from the last
+    /// call.
     void decode(unsigned from, unsigned to);
 
-    /// The results of the last pass, an array of K values for each block, in the order of the pass's constituent
-    /// decoder: decisions, 0 or 1; ratios, aligned words; what goes to the next pass, aligned words: half of the
-    /// extrinsic value, rounded down to an eighth, plus the systematic value.
+    /// The results of the last pass, K values for each block, in the order of the pass's constituent decoder:
+    /// decisions, 0 or 1; ratios, aligned words; the input of the next pass, aligned words: half of the extrinsic
+    /// value, rounded down to an eighth, plus the systematic value.
     void decisions(std::uint8_t* const* blocks);
     void ratios(std::int16_t* const* blocks);
     void joint(std::int16_t* const* blocks);
 
-    /// The input of a block, clipped, as it was loaded last.
+    /// The clipped input of a block, as last loaded.
     LoadedBlock loadedBlock(unsigned block) const;
 
 private:
     static constexpr unsigned mostSteps = 768;
     static constexpr unsigned mostLanes = 64;
 
-    /// The values of a block's tail, position by position, three streams.
+    /// The tail values of a block, three streams position by position.
     using TailValues = std::array<int, rules::tailValues>;
 
-    /// Which block a lane's segment belongs to, and the segment's first position there.
+    /// The block of a lane's segment, and the segment's first position in it.
     struct LaneStart {
         unsigned block;
         unsigned position;
     };
 
-    /// The working memory of one kernel, for one block size.
+    /// The working memory of one kernel for one block size.
     struct Work {
         unsigned blockSize = 0;  ///< 0: none
         std::vector<unsigned char> storage;
@@ -144,8 +144,8 @@ private:
     std::vector<Work> itsWork;  ///< one for each kernel
     const Kernel* itsKernel = nullptr;
     Work* itsCurrent = nullptr;
-    unsigned itsBlocks = 0;       ///< that are loaded
-    unsigned itsLastDecoder = 0;  ///< whose pass was the last one
+    unsigned itsBlocks = 0;       ///< loaded
+    unsigned itsLastDecoder = 0;  ///< the constituent decoder of the last pass
     std::vector<TailValues> itsTails;
 };
 

@@ -1,4 +1,4 @@
-// LaneOrder: which lane works on which segment of which block.
+// LaneOrder: maps lanes to the segments of blocks.
 #ifndef MORVIK_LANES_LANEORDER_H
 #define MORVIK_LANES_LANEORDER_H
 
@@ -6,13 +6,12 @@
 
 namespace morvik::lanes {
 
-/// Blocks of `segments` segments, a power of two, share the lanes of a slice, in groups of `groupLanes`. A block of no
-/// more segments than a group takes as many neighbouring lanes, in order. A larger one takes q whole groups and deals
-/// its segments out to them in turn: a group holds the segments that are equal modulo q, and a vector of several groups
-/// those that are equal modulo the number of the block's vectors. So the interleaver takes, at any step, the values of
-/// a group from one group, and those of a vector from one vector: over the segments u of a step it is a quadratic
-/// permutation polynomial, c + a u + d u^2 with an odd a and an even d, whose value modulo a power of two depends on u
-/// modulo that power alone.
+/// Blocks of `segments` segments, a power of two, share the lanes of a slice, in groups of `groupLanes`. A block that
+/// fits in a group takes adjacent lanes, in order. A larger one takes q whole groups and deals its segments to them in
+/// turn: a group holds the segments equal modulo q, a vector of several groups those equal modulo the number of the
+/// block's vectors. At any step, the interleaver then takes the values of a group from one group, and those of a vector
+/// from one vector: over the segments u of a step it is a quadratic permutation polynomial, c + a u + d u^2 with odd a
+/// and even d, whose value modulo a power of two depends only on u modulo that power.
 class LaneOrder {
 public:
     LaneOrder(unsigned segments, unsigned groupLanes, unsigned vectorLanes)
@@ -47,8 +46,8 @@ public:
 private:
     unsigned itsSegments;
     unsigned itsGroupLanes;
-    unsigned itsGroups;   ///< of a block, 1 if it is a part of one
-    unsigned itsVectors;  ///< of a block, 1 if it is a part of one
+    unsigned itsGroups;   ///< of a block; 1 if it takes a part of one
+    unsigned itsVectors;  ///< of a block; 1 if it takes a part of one
 };
 
 }  // namespace morvik::lanes

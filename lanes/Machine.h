@@ -1,20 +1,20 @@
-// Machine: everything that differs between instruction sets, a section for each that has forms of its own.
+// Machine: everything that differs between instruction sets, one section for each.
 //
-// A section keeps what the one before it does as well. It offers:
+// A section inherits what it does not redefine from the one before. It offers:
 //
 //   VectorLanes             the widths of its vectors
 //   Kernels                 the shapes of its kernels, ascending in lanes
-//   holdsTwoRecursions      whether its registers hold two recursions at a time
-//   tileHalves              halves of the widest tile that it transposes well (Transpose.h)
-//   Permutation<count>      gathers a vector, its lanes permuted
+//   holdsTwoRecursions      whether its registers hold two recursions at once
+//   tileHalves              halves of the widest tile that it transposes efficiently (Transpose.h)
+//   Permutation<count>      gathers a vector with permuted lanes
 //   Table<count>            looks up a table of sixteen values in each lane
-//   scaledHalf(a)           floor(3 a / 8), for any a whose threefold fits 16 bits
-//   saturated(values)       eight 32-bit values, limited to 16 bits
+//   scaledHalf(a)           floor(3 a / 8), for any a with 3 a within 16 bits
+//   saturated(values)       eight 32-bit values, saturated to 16 bits
 //
-// A permutation takes vectors from slices. Their lanes form groups of `group`, each of which takes all of its values
-// from one group of the source slice: LaneOrder.h orders segments so that the interleaver does. A vector's permutation
-// is prepared as the addresses of `sources` such groups, counted in words, and a control of `bytes` bytes, which says
-// from which lane of its group each lane comes.
+// A permutation gathers vectors from slices. Their lanes form groups of `group`, each of which takes all its values
+// from one group of the source slice; LaneOrder.h orders segments so that this holds for the interleaver. A vector's
+// permutation consists of the addresses of `sources` such groups, in words, and a control of `bytes` bytes, which gives
+// each lane's source lane within its group.
 #ifndef MORVIK_LANES_MACHINE_H
 #define MORVIK_LANES_MACHINE_H
 
@@ -28,7 +28,7 @@
 
 namespace morvik::lanes::MORVIK_LANES {
 
-/// Slices of `vectors` vectors of `count` lanes; up to `abreast` windows of one vector go abreast.
+/// Slices of `vectors` vectors of `count` lanes; up to `abreast` windows of one vector run side by side.
 template <unsigned count, unsigned vectors, unsigned abreast = 1>
 struct Shape {
 };
@@ -45,7 +45,7 @@ struct Portable {
     static constexpr bool holdsTwoRecursions = false;
     static constexpr unsigned tileHalves = 1;
 
-    /// The control is the source lanes themselves.
+    /// The control holds the source lanes themselves.
     template <unsigned count>
     struct Permutation {
         static constexpr unsigned group = 8;
@@ -94,7 +94,7 @@ struct Portable {
         return (a + a + a) >> 3;
     }
 
-    /// At any address.
+    /// Accepts any alignment.
     static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
     {
         std::int32_t copies[8];
@@ -152,7 +152,7 @@ struct Ssse3 : Sse2 {
                                                    const std::uint32_t* from,
                                                    const std::uint8_t* control)
         {
-            typename Raw<count>::Signed shuffle;  // copied into an Eighths, it would go through memory
+            typename Raw<count>::Signed shuffle;  // an Eighths would go through memory
             std::memcpy(&shuffle, control, sizeof shuffle);
             using Group = Eighths<count / sources>;
             const Group first = Group::load(slices + from[0]);
@@ -179,7 +179,7 @@ struct Ssse3 : Sse2 {
         /// The entries at `index`, 0 to 15.
         MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
         {
-            // A byte shuffle gives 0 where the index byte's sign bit is set: the upper byte's.
+            // A byte shuffle gives 0 where the index byte's sign bit is set, here in the upper bytes.
             return shuffleBytes(itsEntries, index | Eighths<count>::of(-0x8000));
         }
 
@@ -192,13 +192,13 @@ struct Ssse3 : Sse2 {
 // ---- AVX2: vectors of sixteen lanes
 
 #if defined(__AVX2__)
-/// Two vectors in one.
+/// Joins two vectors into one.
 MORVIK_INLINE Eighths<16> inserted(Eighths<8> a, Eighths<8> b)
 {
     return {(Raw<16>::Signed)_mm256_set_m128i((__m128i)b.v, (__m128i)a.v)};
 }
 
-/// Within each sixteen bytes.
+/// Shuffles within each sixteen bytes.
 MORVIK_INLINE Eighths<16> shuffleBytes(Eighths<16> a, Eighths<16> control)
 {
     return {(Raw<16>::Signed)_mm256_shuffle_epi8((__m256i)a.v, (__m256i)control.v)};
@@ -297,7 +297,7 @@ struct Avx512 : Avx2 {
 };
 #endif
 
-// ---- The one that this compilation is for
+// ---- The machine of this compilation
 
 #if defined(__AVX512BW__) && defined(__AVX512VL__)
 using Machine = Avx512;

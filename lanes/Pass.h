@@ -13,18 +13,18 @@
 
 namespace morvik::lanes::MORVIK_LANES {
 
-/// Whether extrinsic values go on as they are, or times 0.75.
+/// Whether extrinsic values are passed on unscaled, or times 0.75.
 enum class Extrinsic { whole, scaled };
 
 /// Whether a pass keeps its ratios, as the last one does.
 enum class Ratios { dropped, kept };
 
-/// A pass over slices of `vectors` vectors of `count` lanes. All lanes work on the same window of their segments. The
-/// forward recursion leaves its metrics in slots, one for each step; the backward recursion reads them and computes
+/// Runs a pass over slices of `vectors` vectors of `count` lanes. All lanes work on the same window of their segments.
+/// The forward recursion stores its metrics in slots, one for each step; the backward recursion reads them and computes
 /// ratios and joint values.
 ///
-/// The backward recursion starts anew in each window. So `abreast` windows of equal length can go side by side in a
-/// wider vector, where a vector of `count` lanes would leave part of the machine idle.
+/// The backward recursion starts afresh in each window, so `abreast` windows of equal length can run side by side in a
+/// wider vector where a vector of `count` lanes would leave part of the machine idle.
 template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, Extrinsic extrinsic>
 class Pass {
     static constexpr unsigned states = rules::stateCount;
@@ -40,14 +40,14 @@ class Pass {
     using Column = rules::Column<Decision>;
     using WideColumn = rules::Column<WideDecision>;
 
-    /// The metrics of a slot: eight forward metrics, two branch metrics (the others are their doubles: LTE
+    /// The layout of a slot: eight forward metrics, two branch metrics (the other two repeat them: LTE
     /// has no second parity stream, rule 5) and the joint value.
     static constexpr unsigned slotBranches = states * wide;
     static constexpr unsigned slotJoint = slotBranches + 2 * wide;
     static constexpr unsigned slotWords = slotJoint + wide;
 
 public:
-    /// What the workspace must have room for: a step of a window, and the forward recursion between two.
+    /// Memory needed in the workspace: for a step of a window, and for the forward recursion between two windows.
     static constexpr unsigned slotBytes = 2 * slotWords;
     static constexpr unsigned forwardBytes = vectors * static_cast<unsigned>(sizeof(Column));
 
@@ -67,12 +67,12 @@ public:
     {
     }
 
-    /// `isFirst`: this is the decoder's first pass over the block.
+    /// `isFirst`: whether this is the decoder's first pass over the block.
     template <Ratios ratios>
     MORVIK_INLINE void run(bool isFirst) const
     {
-        // The last window starts from what the first one of the next segment reached: in this pass when a window lies
-        // between them, in which the hardware hands it on (rule 20), otherwise in the pass before.
+        // The last window starts from the column that the next segment's first window reached: in this pass if there is
+        // a window in between, during which the hardware hands it on (rule 20), else in the pass before.
         const bool handedWithin = !isFirst && w.windows > 2;
         hand(itsConstituent.alphaReached, w.before, itsConstituent.alphaStart, w.firstLanes);
         if (!handedWithin) {
@@ -97,13 +97,13 @@ public:
     }
 
 private:
-    /// Windows of one vector's lanes that go abreast; the last one repeats where no other is as long. Their slots
-    /// follow each other upwards and downwards in turn: the forward recursion of a window fills the slots that the
-    /// backward recursion of the one before frees.
+    /// Windows of one vector's lanes that run side by side; the last one is repeated if no other has its length. Slots
+    /// are used in alternating direction: the forward recursion of a window fills the slots that the backward recursion
+    /// of the previous one frees.
     struct Windows {
         unsigned r[abreast];
         unsigned v;
-        unsigned length;  ///< 0 when there are no such windows
+        unsigned length;  ///< 0 if there are none
         unsigned from[abreast];
         std::ptrdiff_t slot;
         std::ptrdiff_t direction;
@@ -133,7 +133,7 @@ private:
         return w.windowStart[r + 1] - w.windowStart[r];
     }
 
-    /// The windows after these in the order of work.
+    /// Returns the next windows in processing order.
     MORVIK_INLINE Windows following(const Windows& windows) const
     {
         const std::ptrdiff_t slot = windows.slotOf(windows.length - 1);
@@ -157,8 +157,8 @@ private:
         saveForward(windows.v, a);
     }
 
-    /// The backward recursion of windows, together with the forward recursion of the next ones where registers suffice
-    /// for both: two independent chains keep the processor's units busy.
+    /// Runs the backward recursion of windows, together with the forward recursion of the next ones if registers
+    /// suffice for both: two independent dependency chains keep the execution units busy.
     template <Ratios ratios>
     MORVIK_INLINE void runWindows(const Windows& windows, const Windows& next) const
     {
@@ -190,7 +190,7 @@ private:
         }
     }
 
-    /// The first `steps` steps of the windows.
+    /// Runs the backward recursion over the first `steps` steps of the windows.
     template <Ratios ratios>
     MORVIK_INLINE void backward(const Windows& windows, unsigned steps, WideColumn& b) const
     {
@@ -201,7 +201,7 @@ private:
         }
     }
 
-    /// All forward steps of the next window, which is no longer, and as many backward steps of the windows.
+    /// Runs all forward steps of the next window, which is not longer, and as many backward steps of the windows.
     template <Ratios ratios>
     MORVIK_INLINE void both(const Windows& windows, WideColumn& b, const Windows& next, Column& a) const
     {
@@ -215,7 +215,7 @@ private:
         }
     }
 
-    /// Step `i` of all vectors' steps. `slot` begins at the window's lanes.
+    /// Runs step `i` of all vectors' steps. `slot` points to the window's lanes.
     MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a) const
     {
         const std::uint32_t* const sources = itsInterleaver.sources + i * Permutation::sources;
@@ -247,8 +247,8 @@ private:
         storeValues(windows, i, nextJoint(ratio, joint, valuesAt(windows, i, itsSystematic)), itsJoint);
     }
 
-    /// The extrinsic value x = ratio - 2 joint is scaled, rounded down and clipped (rule 14), and enters the other
-    /// decoder halved and rounded down (rule 13): one rounding does for all.
+    /// The extrinsic value x = ratio - 2 joint is scaled, rounded down and clipped (rule 14), then halved and rounded
+    /// down again in the other decoder (rule 13): one rounding suffices.
     static MORVIK_INLINE WideValue nextJoint(WideValue ratio, WideValue joint, WideValue systematic)
     {
         const WideValue x = ratio - (joint + joint);
@@ -256,7 +256,7 @@ private:
         return clip(half, branchMin / 2, branchMax / 2) + systematic;
     }
 
-    /// Step `i` of window `j` among the steps of all vectors.
+    /// Returns the index of step `i` of window `j` among the steps of all vectors.
     MORVIK_INLINE std::size_t at(const Windows& windows, unsigned j, std::size_t i) const
     {
         return std::size_t{windows.v} * itsSteps + windows.from[j] + i;
@@ -315,7 +315,7 @@ private:
         return a;
     }
 
-    /// The column shifted so that state 0 is near 0, which changes no border column (Bounds.h).
+    /// Normalises a column so that state 0 is near 0, which changes no border column (Bounds.h).
     template <class AnyDecision>
     static MORVIK_INLINE rules::Column<AnyDecision> broughtBack(rules::Column<AnyDecision> m)
     {
@@ -334,8 +334,8 @@ private:
         });
     }
 
-    /// Where a window ends, the window before it starts next time; before the first one, the last window of the segment
-    /// before.
+    /// Stores the column where a window ends, the next start of the window before it; for the first window, that is the
+    /// last window of the segment before.
     MORVIK_INLINE void storeReached(const Windows& windows, const WideColumn& b) const
     {
         const WideColumn m = broughtBack<WideDecision>(b);
@@ -359,7 +359,7 @@ private:
              w.lastLanes);
     }
 
-    /// Columns move to a neighbouring segment's lane; segments at a block's border keep theirs.
+    /// Moves columns to a neighbouring segment's lane; segments at a block's border keep theirs.
     MORVIK_INLINE void hand(const std::int16_t* columns,
                             const Permutations& from,
                             std::int16_t* to,
@@ -379,7 +379,7 @@ private:
     const Workspace& w;
     const Constituent& itsConstituent;
 
-    // Copies for every step: stores of values might change what is behind a reference.
+    // Copies, since the compiler would reload members behind a reference after every store.
     const unsigned itsSteps;
     const std::int16_t* const itsSource;  ///< joint values of the other decoder
     const Permutations itsInterleaver;

@@ -1,4 +1,4 @@
-// Rules: the two ways to decide that the hardware's algorithm types use, over lanes.
+// Rules: the two decision rules of the hardware's algorithm types, over lanes.
 #ifndef MORVIK_LANES_RULES_H
 #define MORVIK_LANES_RULES_H
 
@@ -15,7 +15,7 @@ using StateMetrics = std::array<Eighths<count>, rules::stateCount>;
 template <unsigned count>
 using BranchMetrics = rules::BranchMetrics<Eighths<count>>;
 
-/// The eight metrics of a slot, side by side in memory.
+/// The eight metrics of a slot, contiguous in memory.
 template <unsigned count>
 struct StoredColumn {
     const std::int16_t* metrics;
@@ -40,9 +40,8 @@ struct Greatest {
         return {};
     }
 
-    /// Takes b a step back and gives the step's ratio. The greatest of all does not depend on the order of
-    /// comparison, nor on when the branch metric is added: the candidates of the backward recursion serve
-    /// once more, pair by pair.
+    /// Moves b a step back and returns the step's ratio. The maximum depends neither on the order of comparison nor on
+    /// when the branch metric is added, so the candidates of the backward recursion are reused, pair by pair.
     MORVIK_INLINE Eighths<count> stepBack(const StoredColumn<count>& a,
                                           rules::Column<Decision>& b,
                                           const BranchMetrics<count>& g) const
@@ -61,19 +60,19 @@ struct Greatest {
     }
 };
 
-/// The correction table, called with a decision difference.
+/// Looks up the correction of a decision difference.
 template <unsigned count>
 struct Corrections {
     Machine::Table<count> table;
 
     MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
     {
-        const Eighths<count> magnitude = max(difference, Eighths<count>::of(-1) - difference);  // -1 reads like 0
+        const Eighths<count> magnitude = max(difference, Eighths<count>::of(-1) - difference);  // -1 reads as 0
         return table.at(min(magnitude, Eighths<count>::of(4 * 15)) >> 2);
     }
 };
 
-/// "MOD#": max-log-MAP with a correction that comes one stage late.
+/// "MOD#": max-log-MAP with a correction one stage late.
 template <unsigned countOfLanes>
 struct Corrected {
     static constexpr unsigned count = countOfLanes;

@@ -1,4 +1,4 @@
-// Transpose: between the caller's arrays, one for each lane, and slices, one for each step.
+// Transpose: converts between the caller's arrays, one for each lane, and slices, one for each step.
 #ifndef MORVIK_LANES_TRANSPOSE_H
 #define MORVIK_LANES_TRANSPOSE_H
 
@@ -10,8 +10,8 @@
 
 namespace morvik::lanes::MORVIK_LANES {
 
-/// Eight by eight words, in each of `halves` halves of eight vectors: vector i holds eight steps of lane i, and of
-/// lane 8 + i; transposed, step i of eight lanes, and of the next eight.
+/// Eight by eight words in each of `halves` halves of eight vectors. Vector i holds eight steps of lane i and, in its
+/// other half, of lane 8 + i; transposed, step i of eight lanes, and of the next eight.
 template <unsigned halves>
 class Tile {
 public:
@@ -44,7 +44,7 @@ public:
     }
 
 private:
-    /// Four words of each half from `from` on, of a and b in turn.
+    /// Interleaves four words of a and b, from `f` on, in each half.
     template <int f>
     static MORVIK_INLINE Vector alternate(Vector a, Vector b)
     {
@@ -75,12 +75,12 @@ private:
     Vector itsVectors[size];
 };
 
-/// The best one for vectors of `count` lanes.
+/// The best tile for vectors of `count` lanes.
 template <unsigned count>
 using TileOf = Tile<(count < 16 ? 1 : Machine::tileHalves)>;
 
-/// Eight of the caller's values, at any address. Only their low 24 bits count (rule 4); what is beyond 16 bits comes
-/// out as another value beyond the input format.
+/// Loads eight of the caller's values, at any alignment. Only their low 24 bits count (rule 4); a value beyond 16 bits
+/// becomes another value outside the input format.
 template <class Input>
 MORVIK_INLINE Raw<8>::Signed inputWords(const Input* values)
 {
@@ -99,8 +99,8 @@ MORVIK_INLINE Raw<8>::Signed inputWords(const Input* values)
     }
 }
 
-/// Eight values for each half of a tile. One beyond the input format, -128 to 127, leaves bits in `beyond` above the
-/// low eight.
+/// Loads eight values for each half of a tile. A value outside the input format, -128 to 127, sets bits of `beyond`
+/// above the low eight.
 template <class AnyTile, class Input>
 MORVIK_INLINE typename AnyTile::Vector inputVector(const Input* const* arrays,
                                                    unsigned k,
@@ -118,7 +118,7 @@ MORVIK_INLINE typename AnyTile::Vector inputVector(const Input* const* arrays,
 }
 
 /// Fills slices of `count` values, a multiple of eight, from as many arrays of `steps` values each, eight or more.
-/// Returns whether all values were within the input format; otherwise the slices are useless.
+/// Returns false if a value was outside the input format: the slices are then invalid.
 template <unsigned count, class Input>
 bool fillSlices(const Input* const* arrays, unsigned steps, std::int16_t* slices)
 {
@@ -144,7 +144,7 @@ bool fillSlices(const Input* const* arrays, unsigned steps, std::int16_t* slices
     return any < 256;
 }
 
-/// Spreads slices of ratios over arrays, one for each lane: as aligned words, or as the decisions they make.
+/// Writes slices of ratios to arrays, one for each lane, as aligned words or as decisions.
 template <unsigned count, class Output>
 void spreadSlices(const std::int16_t* slices, unsigned steps, Output* const* arrays)
 {
@@ -161,7 +161,7 @@ void spreadSlices(const std::int16_t* slices, unsigned steps, Output* const* arr
             for (unsigned i = 0; i < BestTile::size; ++i) {
                 Outputs values;
                 if constexpr (sizeof(Output) == 1) {
-                    // A ratio of 0 or more decides for 1 (rule 16): its sign bit is clear.
+                    // A ratio of 0 or more decides for 1 (rule 16): the sign bit is clear.
                     values = __builtin_convertvector((tile[i] >> 15) + 1, Outputs);
                 } else {
                     // Aligned words wrap (rule 8).

@@ -1,4 +1,4 @@
-// Unaligned: elements of the caller's arrays, which may begin at any address.
+// Unaligned: access to the caller's arrays, which may have any alignment.
 #ifndef MORVIK_LANES_UNALIGNED_H
 #define MORVIK_LANES_UNALIGNED_H
 

@@ -1,10 +1,10 @@
 // Words: vectors of 16-bit words, the value type over which the lanes run the trellis.
 //
-// `Eighths` counts eighths, the unit of soft values and metrics. Aligned words have four bits below it, always 0. Here
-// these four are at the top instead: no metric wraps, and a plain maximum decides (Bounds.h proves it).
+// `Eighths` counts eighths, the unit of soft values and metrics. Aligned words have four zero bits below that unit;
+// here the four bits are headroom at the top, so no metric wraps and a plain maximum decides (proof in Bounds.h).
 //
-// Each instruction set compiles this text in a namespace of its own, MORVIK_LANES, so that nothing compiled for one
-// serves another.
+// Each instruction set compiles this header in its own namespace, MORVIK_LANES, so that no code is shared between
+// instruction sets.
 #ifndef MORVIK_LANES_WORDS_H
 #define MORVIK_LANES_WORDS_H
 
@@ -21,7 +21,7 @@ struct Raw {
     typedef std::uint16_t Unsigned __attribute__((vector_size(2 * count)));
 };
 
-/// Eighths, in each of `count` lanes. No operation leaves 16 bits.
+/// Eighths in each of `count` lanes. No operation may overflow 16 bits.
 template <unsigned count>
 struct Eighths {
     using Vector = typename Raw<count>::Signed;
@@ -33,7 +33,7 @@ struct Eighths {
         return {Vector{} + static_cast<std::int16_t>(value)};
     }
 
-    /// From an address that is a multiple of the vector's size.
+    /// Requires an address aligned to the vector's size.
     static MORVIK_INLINE Eighths load(const std::int16_t* from)
     {
         Vector v;
@@ -87,7 +87,7 @@ struct Eighths {
         return max(min(a, of(hi)), of(lo));
     }
 
-    /// b where mask is all ones, a where it is 0.
+    /// b where the mask is all ones, a where it is 0.
     friend MORVIK_INLINE Eighths blend(Eighths mask, Eighths a, Eighths b)
     {
         return {(a.v & ~mask.v) | (b.v & mask.v)};
@@ -114,7 +114,7 @@ struct Eighths {
     }
 };
 
-/// The lanes of two vectors, side by side in one.
+/// Concatenates two vectors.
 template <unsigned count>
 MORVIK_INLINE Eighths<2 * count> join(Eighths<count> a, Eighths<count> b)
 {
@@ -122,7 +122,7 @@ MORVIK_INLINE Eighths<2 * count> join(Eighths<count> a, Eighths<count> b)
     return {__builtin_shufflevector(a.v, b.v, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15)};
 }
 
-/// Part `index` of a vector of which each has `count` lanes.
+/// Returns part `index` of a vector, in parts of `count` lanes.
 template <unsigned count, unsigned index, unsigned wide>
 MORVIK_INLINE Eighths<count> part(Eighths<wide> a)
 {

@@ -1,9 +1,8 @@
-// Workspace: what the lanes work on, as plain data.
+// Workspace: the working memory of the lanes, as plain data.
 //
 // A lane works on a segment of a block; several blocks of one size may share the lanes (LaneOrder.h). A slice holds one
-// trellis step: a value for each lane, in one vector or several. An array of slices has all steps of the first vector,
-// then those of the next. It is aligned to 64 bytes.
-// Soft values and metrics count eighths.
+// trellis step: a value for each lane, in one or more vectors. An array of slices holds all steps of the first vector,
+// then those of the next, and is aligned to 64 bytes. Soft values and metrics are in eighths.
 #ifndef MORVIK_LANES_WORKSPACE_H
 #define MORVIK_LANES_WORKSPACE_H
 
@@ -11,7 +10,7 @@
 
 namespace morvik::lanes {
 
-/// Where the vectors of slices come from; the form is the machine's own (Machine.h).
+/// The sources of the vectors of slices, in a machine-specific form (Machine.h).
 struct Permutations {
     const std::uint32_t* sources;
     const std::uint8_t* controls;
@@ -21,27 +20,27 @@ struct Permutations {
 struct Constituent {
     std::int16_t* systematic;  ///< [vector][step][lane]
     std::int16_t* parity;      ///< [vector][step][lane]
-    /// [vector][step][lane] What goes to the other decoder, twice its intrinsic value: half of the extrinsic value, as
-    /// an a-priori value enters, plus the systematic value.
+    /// [vector][step][lane] The input of the other decoder, twice its intrinsic value: half of the extrinsic value, its
+    /// a-priori value, plus the systematic value.
     std::int16_t* joint;
-    Permutations interleaver;  ///< [vector][step + ahead] the other decoder's values that enter a step
+    Permutations interleaver;  ///< [vector][step + ahead] the other decoder's values used in a step
     std::int16_t* alphaStart;  ///< [state][lane] start columns of the segments
     std::int16_t* betaStart;   ///< [window][state][lane] start columns of the windows
-    /// [state][lane] the columns that the last pass reached at the ends of segments, and at the beginnings: where
-    /// their neighbours start.
+    /// [state][lane] the columns that the last pass reached at the ends of segments, and at their beginnings: the start
+    /// columns of their neighbours.
     std::int16_t* alphaReached;
     std::int16_t* betaReached;
 };
 
-/// How many steps ahead of its use the source of a slice is fetched.
+/// How many steps ahead the source of a slice is prefetched.
 constexpr unsigned fetchAhead = 8;
 
 struct Workspace {
-    unsigned steps;               ///< of a segment
-    unsigned windows;             ///< of a segment
+    unsigned steps;               ///< per segment
+    unsigned windows;             ///< per segment
     const unsigned* windowStart;  ///< [window + 1] the first step of each window, then `steps`
     Constituent constituent[2];
-    const std::uint8_t* corrections;  ///< [16] corrections by a quarter of the difference
+    const std::uint8_t* corrections;  ///< [16] corrections, indexed by a quarter of the difference
     Permutations before;              ///< [vector] each segment from the segment before it
     Permutations after;               ///< [vector] each segment from the segment after it
     const std::int16_t* firstLanes;   ///< [lane] all ones for each block's first segment, else 0
