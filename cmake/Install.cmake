@@ -1,7 +1,7 @@
-# What `cmake --install` puts where: the library with its headers, the CMake package and the pkg-config file by which
-# others find it, the command with its manual pages and completions, and the pages of docs/. All paths are relative to
-# each other, so an installed tree can be moved. Where the library alone is built,
-# `cmake --install FOLDER --component library` installs it without the others. packaging/ has Debian's layout.
+# The layout of `cmake --install`: the library with its headers, CMake package and pkg-config file, the command with its
+# manual pages and completions, and the pages of docs/. All paths are relative, so an installed tree can be moved. If
+# only the library is built, `cmake --install FOLDER --component library` installs it alone. packaging/ has Debian's
+# layout.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 set(library morvik_v1_0_bitacc_cmodel)
@@ -15,7 +15,7 @@ install(TARGETS ${library} morvik_classes EXPORT ${library}
 install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 
-# The class headers, and those that they need. Their names are common: they keep to a folder of their own.
+# The class headers and those that they include. Their names are common, so they have a folder of their own.
 set(classes_dir ${CMAKE_INSTALL_INCLUDEDIR}/morvik_v1_0_classes)
 set(MORVIK_CLASS_HEADERS
     Misc.h
@@ -40,13 +40,13 @@ if(TARGET morvik-mpi)
     list(APPEND commands morvik-mpi)
 endif()
 file(RELATIVE_PATH to_libraries ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LIBDIR})
-# The build's library is in ../lib, so that nothing is rewritten when the command is installed.
+# The build's library is in ../lib, so that installation need not rewrite the command.
 set(runtime_path "$ORIGIN/${to_libraries}" "$ORIGIN/../lib")
 list(REMOVE_DUPLICATES runtime_path)
 set_target_properties(${commands} PROPERTIES INSTALL_RPATH "${runtime_path}" BUILD_WITH_INSTALL_RPATH ON)
 install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT command)
 
-# Manual pages, completions, and the pages that they refer to.
+# Manual pages, completions, and the documents that they refer to.
 foreach(command IN LISTS commands)
     install(DIRECTORY ${MORVIK_REFERENCE_DIR}/${command}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} COMPONENT command)
 endforeach()
@@ -54,7 +54,7 @@ install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT documents
     FILES_MATCHING PATTERN *.md PATTERN *.svg PATTERN *.png)
 
 install(EXPORT ${library} NAMESPACE morvik:: FILE ${library}Config.cmake DESTINATION ${package_dir})
-# A consumer of the other word size is told so, rather than failing in its linker.
+# A consumer of the other word size gets a message rather than a linker error.
 write_basic_package_version_file(${PROJECT_BINARY_DIR}/${library}ConfigVersion.cmake COMPATIBILITY SameMajorVersion)
 install(FILES ${PROJECT_BINARY_DIR}/${library}ConfigVersion.cmake DESTINATION ${package_dir})
 

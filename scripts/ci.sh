@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Runs locally what continuous integration runs: all stages, or the named ones.
+# Runs the stages of continuous integration locally, all or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
 # named: abi-renew mutate packages starts memory-short
@@ -20,16 +20,16 @@ stage_lint() {
         --suppress=internalAstError -I include -I src -I . base src link simulation report hardware validation app
 }
 
-# Takes as long as all the rest.
+# Takes as long as all other stages together.
 stage_lint-tests() {
     tidy {tests,bench}/'*.cpp'
 }
 
 tidy() {
     scripts/build x86_64
-    # Standard error counts what it suppresses, and says why it could not run.
+    # Standard error has the number of suppressed warnings, and the reason if it could not run.
     local log=build/x86_64/lint.log
-    # Flags that clang does not know are removed from the commands.
+    # Removes flags unknown to clang from the commands.
     mkdir -p build/lint
     sed 's/ -fno-tree-[a-z]*//g' build/x86_64/compile_commands.json >build/lint/compile_commands.json
     # A unit of bench/ needs a package that is not installed here, and Octave's own compiler builds its function.
@@ -52,7 +52,7 @@ stage_compilers() {
     done
 }
 
-# The binary interface against the committed one, which is stored compressed.
+# Compares the binary interface with the committed one, which is stored compressed.
 stage_abi() {
     local bits
     for bits in 64 32; do
@@ -66,7 +66,7 @@ compare_abi() {
     abidiff "build/abi-$1.xml" "$(library_of "$1")"
 }
 
-# Commits to the current interface, after an intended change.
+# Makes the current interface the committed one, after an intended change.
 stage_abi-renew() {
     local bits
     for bits in 64 32; do
@@ -74,7 +74,7 @@ stage_abi-renew() {
     done
 }
 
-# What no header declares that users include may change.
+# What users' headers do not declare may change.
 write_abi() {
     scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel
     local headers=build/abi-headers
@@ -90,15 +90,15 @@ library_of() {
     echo "build/abi-$1/lib/libmorvik_v1_0_bitacc_cmodel.so"
 }
 
-# Address and undefined behaviour sanitizers on all tests; then valgrind, which detects reads of uninitialised memory,
+# Address and undefined behaviour sanitizers on all tests, then valgrind, which detects reads of uninitialised memory,
 # on those that decode.
 stage_memory() {
     # Long simulations would take ten minutes here; the other tests of the command run the same code.
     memory_without '^(BerRuns|MpiRuns|Diagnosis\.(FindsEachMistakeInEachSize|BlamesNoiseAlone))'
 }
 
-# Leaves out the other long tests whose code shorter ones run: statistics over many blocks, self-tests, a dump for each
-# fault, and scripts that check numbers.
+# Leaves out other long tests whose code shorter tests run as well: statistics over many blocks, self-tests, a dump for
+# each fault, and scripts that check numbers.
 stage_memory-short() {
     local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance'
     local long="BerRuns|MpiRuns|Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore"
@@ -106,7 +106,7 @@ stage_memory-short() {
     memory_without "^($long|CommandTrace\.NeedsNoMore|DefaultScaleTest\.HalfAnd|($scripts)\$)"
 }
 
-# memory_without REGEX: of the names of tests
+# memory_without REGEX: a pattern of test names
 memory_without() {
     scripts/build sanitize
     scripts/run-tests sanitize -E "$1"
@@ -124,9 +124,8 @@ stage_threads() {
     build/threads/tests/simulation_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
 }
 
-# Every fuzzer on its corpus and some thousand inputs derived from it, always the same ones. HOSTILE_SECONDS gives each
-# a time instead, and other inputs; HOSTILE_CORPUS names a folder that keeps the findings of long runs, from which the
-# next run continues.
+# Every fuzzer on its corpus and a few thousand inputs derived from it, always the same ones. With HOSTILE_SECONDS each
+# runs for that time on varying inputs; HOSTILE_CORPUS names a folder that keeps the findings of long runs for the next.
 stage_hostile() {
     local fuzzers
     mapfile -t fuzzers < <(sed -n '/^foreach(fuzzer/,/)$/s/^ *\([a-z_]*_fuzz\).*/\1/p' tests/fuzz/CMakeLists.txt)
@@ -165,18 +164,18 @@ count_lines() {
         --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
 }
 
-# Only when named: it takes most of an hour.
+# Runs only when named: takes most of an hour.
 stage_mutate() {
     scripts/mutate
 }
 
-# Only when named: it builds a Debian system from downloads.
+# Runs only when named: builds a Debian system from downloads.
 stage_packages() {
     scripts/packages
     tests/packages/clean_root.sh build/packages
 }
 
-# The shortest form of everything that is rarely run, so that it keeps working.
+# Runs everything that is rarely run in its shortest form, so that it keeps working.
 stage_starts() {
     tidy tests/builds/digest.cpp bench/Limits.cpp
     local preset

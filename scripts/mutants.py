@@ -7,7 +7,7 @@ from typing import NamedTuple
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
 
-# Where to mutate: files, and the named functions in them, or all.
+# Where to mutate: files, and in them all functions or the named ones.
 PLACES = {
     "rules/Arithmetic.h": None,
     "rules/BlockSizes.h": ["findBlockSize"],
@@ -58,7 +58,7 @@ WORDS = [("add", "subtract"), ("subtract", "add"), ("addWrap", "subWrap"), ("sub
          ("even", "odd"), ("one", "zero"), ("c1", "c2"), ("c2", "c1"), ("from", "to"), ("to", "from"),
          ("lo", "hi"), ("itsMin", "itsMax"), ("itsMinQ", "itsMaxQ"), ("itsMaxQ", "itsMinQ")]
 
-# Mutants without an observable effect: for each file the reason, and the old and new line of each, cut to what matters.
+# Equivalent mutants: for each file the reason, and the relevant part of each old and new line.
 EQUIVALENT = {
     "rules/Arithmetic.h": [
         ("a value that equals the limit becomes the limit",
