@@ -1,4 +1,4 @@
-// Accidents: what people do to a file of soft values by mistake, done on purpose.
+// Accidents: common mistakes in files of soft values, made on purpose.
 #include "Accidents.h"
 
 #include <algorithm>
@@ -17,7 +17,7 @@ std::array<Stream*, 3> streamsOf(SentFrame& frame)
     return {&frame.soft.sys, &frame.soft.par1, &frame.soft.par2};
 }
 
-/// The standard's tail taken apart: systematic and parity values of both encoders.
+/// The standard's tail, separated into systematic and parity values of both encoders.
 struct Tail {
     std::array<int, 3> x, z, x2, z2;
 };
@@ -50,7 +50,7 @@ void negate(Stream& stream)
     }
 }
 
-/// Puts `count` rows of small values before row `place`.
+/// Inserts `count` rows of small values before row `place`.
 void insertRows(SentFrame& frame, std::size_t place, std::size_t count)
 {
     for (Stream* stream : streamsOf(frame)) {

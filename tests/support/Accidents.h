@@ -1,4 +1,4 @@
-// Accidents: what people do to a file of soft values by mistake, done on purpose.
+// Accidents: common mistakes in files of soft values, made on purpose.
 #ifndef MORVIK_TESTS_SUPPORT_ACCIDENTS_H
 #define MORVIK_TESTS_SUPPORT_ACCIDENTS_H
 
@@ -10,7 +10,7 @@
 
 namespace morvik::support {
 
-/// A block on its way to a file, and its line of the reference.
+/// The soft values of a block, and its reference bits.
 struct SentFrame {
     blocks::Block soft;
     std::vector<int> bits;
@@ -21,17 +21,17 @@ std::vector<SentFrame> sentFrames(unsigned K, unsigned count, double deviation, 
 
 struct Accident {
     std::string kind;  ///< accidents of one kind exclude each other
-    std::string what;  ///< how the doctor calls it
+    std::string what;  ///< the doctor's name for it
     std::function<void(SentFrame&)> happen;
 };
 
-/// All but those of the scale and of the size, in the order in which they have to happen.
+/// All accidents except those of scale and size, in the order in which they must happen.
 const std::vector<Accident>& accidents();
 
-/// Values in other units: multiplied and rounded.
+/// Converts values to other units: multiplies and rounds.
 void multiply(SentFrame& frame, double factor);
 
-/// The text of a file of soft values, and of its reference.
+/// The text of a file of soft values, and that of its reference.
 std::string softText(const std::vector<SentFrame>& frames);
 std::string bitText(const std::vector<SentFrame>& frames);
 

@@ -15,10 +15,10 @@ namespace morvik::blocks {
 using State = veltra_ip_morvik_v1_0_state;
 using BatchOutputs = veltra_ip_morvik_v1_0_batch_outputs;
 
-/// The names of those that this machine has, the best first; `component` is the last.
+/// The names of the instruction sets of this machine, best first; the last is `component`.
 std::vector<std::string> instructionSets();
 
-/// Blocks of one size as the batch interface takes them.
+/// Blocks of one size in the layout of the batch interface.
 template <class Input>
 struct Batch {
     std::vector<Input> sys;
@@ -29,20 +29,20 @@ struct Batch {
 
     Batch() = default;
 
-    /// Values that the type does not hold lose their upper bits.
+    /// Values too large for the type lose their upper bits.
     explicit Batch(const std::vector<Block>& blocks);
 
-    /// One of its blocks, as the single call takes it.
+    /// One of its blocks, for a single call.
     Block block(std::size_t b) const;
 
     std::int32_t simulate(State* state, unsigned iterations, const std::uint32_t* tags, BatchOutputs* outputs) const;
 
-    /// `room` is what the errors are said to have room for.
+    /// `room`: the claimed size of `errors`.
     std::int32_t countErrors(
         State* state, unsigned iterations, const std::uint8_t* sent, std::uint32_t* errors, std::size_t room) const;
 };
 
-/// The function for a type of soft values.
+/// Calls the batch function for the type of soft values.
 std::int32_t simulateBatch(State* state,
                            const std::int32_t* const* streams,
                            std::int32_t dinSize,
@@ -65,14 +65,14 @@ std::int32_t simulateBatch(State* state,
                            const std::uint32_t* tags,
                            BatchOutputs* outputs);
 
-/// What some blocks give: one array of all blocks' values each.
+/// The results of several blocks: one array of all blocks' values each.
 struct Decoded {
     std::vector<std::uint8_t> bits;
     std::vector<std::int16_t> ratios;
     std::vector<std::uint32_t> tags;
 };
 
-/// The same blocks handed over one by one to a state whose components decode.
+/// Decodes the same blocks one by one, with a state's components.
 template <class Input>
 Decoded decodedOneByOne(State* components, const Batch<Input>& batch, unsigned iterations, const std::uint32_t* tags);
 

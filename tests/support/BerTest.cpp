@@ -1,4 +1,4 @@
-// BerTest: what the tests of `morvik ber` share.
+// BerTest: fixture and helpers for the tests of `morvik ber`.
 #include "BerTest.h"
 
 #include <algorithm>

@@ -1,4 +1,4 @@
-// BerTest: what the tests of `morvik ber` share.
+// BerTest: fixture and helpers for the tests of `morvik ber`.
 #ifndef MORVIK_TESTS_SUPPORT_BERTEST_H
 #define MORVIK_TESTS_SUPPORT_BERTEST_H
 
@@ -18,23 +18,23 @@ Arguments words(const std::string& text);
 /// Both lists, one after the other.
 Arguments operator+(Arguments first, const Arguments& second);
 
-/// A result file or a printed table with all times, and speeds, as T.
+/// A result file or a printed table with all times and speeds replaced by T.
 std::string withoutTimes(const std::string& text);
 
-/// A row of a CSV file, by the names of its columns.
+/// A row of a CSV file, by column name.
 using CsvRow = std::map<std::string, std::string>;
 std::vector<CsvRow> csvRows(const std::string& text);
 
-/// Has the command at hand, in a directory of its own.
+/// Runs the command in a directory of its own.
 class BerTest : public CommandTest {
 protected:
-    /// Runs `morvik ber`, and expects that it succeeds. Returns what it printed.
+    /// Runs `morvik ber`, expects success and returns its output.
     std::string ber(const Arguments& arguments) const;
 
-    /// Runs `morvik ber` with an output file, whatever it was before, and returns that without times.
+    /// Runs `morvik ber` with an output file, overwriting it, and returns the file without times.
     std::string berFile(const Arguments& arguments, const std::string& output = "results.csv") const;
 
-    /// Runs the command, and expects that it is refused in this one line.
+    /// Runs the command and expects a refusal with just this line.
     void expectRefused(const Arguments& arguments, const std::string& line) const;
 };
 

@@ -1,4 +1,4 @@
-// Blocks: code blocks for tests, made from a seed, and a decoder to hand them to.
+// Blocks: seeded code blocks for tests, and a decoder for them.
 #include "Blocks.h"
 
 #include <array>
@@ -14,7 +14,7 @@ namespace morvik::blocks {
 
 namespace {
 
-/// One constituent encoder: a shift register of three delays, the newest first.
+/// A constituent encoder: a shift register of three delays, newest first.
 class ConstituentEncoder {
 public:
     struct Output {
@@ -31,7 +31,7 @@ public:
         return {bit, parity};
     }
 
-    /// A step towards state 0: the bit that makes the feedback vanish.
+    /// Makes a step towards state 0, with the bit that cancels the feedback.
     Output terminate()
     {
         return step(itsDelay[1] ^ itsDelay[2]);

@@ -1,4 +1,4 @@
-// Blocks: code blocks for tests, made from a seed, and a decoder to hand them to.
+// Blocks: seeded code blocks for tests, and a decoder for them.
 #ifndef MORVIK_TESTS_SUPPORT_BLOCKS_H
 #define MORVIK_TESTS_SUPPORT_BLOCKS_H
 
@@ -11,7 +11,7 @@
 
 namespace morvik::blocks {
 
-/// The same numbers on every machine: only the raw output of the generator is used.
+/// Gives the same numbers on every machine: only the generator's raw output is used.
 using Random = std::mt19937;
 
 /// A number from `first` to `last`.
@@ -19,7 +19,7 @@ int between(Random& random, int first, int last);
 
 using Stream = std::vector<std::int32_t>;
 
-/// The three streams of a block as the C interface takes them, K + 4 values each.
+/// The three streams of a block for the C interface, K + 4 values each.
 struct Block {
     Stream sys;
     Stream par1;
@@ -31,24 +31,24 @@ std::vector<unsigned> blockSizes();
 
 std::vector<int> randomBits(Random& random, unsigned K);
 
-/// The turbo encoder of 3GPP TS 36.212, clause 5.1.3.2: each coded bit b as the soft value
-/// amplitude * (2 b - 1), the tail in the standard's order.
+/// Encodes by 3GPP TS 36.212, clause 5.1.3.2. Each coded bit b becomes the soft value
+/// amplitude * (2 b - 1); the tail is in the standard's order.
 Block encode(const std::vector<int>& bits, int amplitude);
 
 /// Adds noise of about the given standard deviation (a sum of uniform numbers).
 void addNoise(Random& random, double deviation, Block& block);
 
-/// How the soft values of a block without a code are drawn.
+/// The distribution of the soft values of an uncoded block.
 enum class Values {
     uniform,     ///< -128 to 127
-    extreme,     ///< -128 or 127 alone
+    extreme,     ///< only -128 and 127
     small,       ///< -2 to 2: many ties
-    saturating,  ///< far beyond -128 to 127, among them values that wrap in 32 bits
+    saturating,  ///< far beyond -128 to 127, including values that wrap in 32 bits
 };
 
 Block randomBlock(Random& random, unsigned K, Values values);
 
-/// A decoder state that is released at the end of its life.
+/// Owns a decoder state.
 class Decoder {
 public:
     Decoder(int units, int algorithm, int tagWidth = 8);
@@ -61,7 +61,7 @@ public:
         return itsState;
     }
 
-    /// From now on the components decode, so that their columns and values can be looked at.
+    /// Switches to decoding by the components, so that their columns and values can be inspected.
     void decodeByComponents();
 
     struct Result {
@@ -70,7 +70,7 @@ public:
         std::uint32_t tag;
     };
 
-    /// One simulation call with room enough for the decisions.
+    /// Makes one simulation call, with enough room for the decisions.
     Result decode(const Block& block, unsigned iterations, std::uint32_t tag = 0);
 
 private:

@@ -1,4 +1,4 @@
-// CapturedStreams: collects what the library writes while it lives.
+// CapturedStreams: captures the library's output during its lifetime.
 #ifndef MORVIK_TESTS_SUPPORT_CAPTUREDSTREAMS_H
 #define MORVIK_TESTS_SUPPORT_CAPTUREDSTREAMS_H
 
@@ -6,8 +6,7 @@
 #include <sstream>
 #include <string>
 
-/// Takes the place of the standard output and error streams' buffers, and gives them back at the
-/// end of its life.
+/// Replaces the buffers of standard output and standard error, and restores them on destruction.
 class CapturedStreams {
 public:
     CapturedStreams() : itsCout(std::cout.rdbuf(itsOut.rdbuf())), itsCerr(std::cerr.rdbuf(itsErr.rdbuf())) {}

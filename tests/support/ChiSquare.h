@@ -1,4 +1,4 @@
-// ChiSquare: how well counts fit what is expected of them.
+// ChiSquare: tests how well counts fit their expectations.
 #ifndef MORVIK_TESTS_SUPPORT_CHISQUARE_H
 #define MORVIK_TESTS_SUPPORT_CHISQUARE_H
 
@@ -6,8 +6,8 @@
 #include <cstddef>
 #include <vector>
 
-/// Standard deviations by which chi-square is greater than its mean. Neighbours of which less than ten are expected
-/// are taken together. `bothCounted` when the expectations are counts of as many draws.
+/// Returns by how many standard deviations chi-square exceeds its mean. Adjacent classes with expectations below ten
+/// are merged. `bothCounted`: the expectations are counts themselves, of as many draws.
 inline double chiSquareExcess(const std::vector<double>& counted, const std::vector<double>& expected, bool bothCounted)
 {
     double sum = 0;

@@ -1,11 +1,11 @@
-// CommaLocale: a global locale in which numbers are written differently.
+// CommaLocale: a global locale with a different number format.
 #ifndef MORVIK_TESTS_SUPPORT_COMMALOCALE_H
 #define MORVIK_TESTS_SUPPORT_COMMALOCALE_H
 
 #include <locale>
 #include <string>
 
-/// Number punctuation of a locale that writes 1.234,5.
+/// The number punctuation of a locale that writes 1.234,5.
 class CommaPunctuation : public std::numpunct<char> {
 protected:
     char do_decimal_point() const override
@@ -24,7 +24,7 @@ protected:
     }
 };
 
-/// Makes CommaPunctuation the global locale's for the lifetime of the object.
+/// Gives the global locale CommaPunctuation for the lifetime of the object.
 class CommaLocale {
 public:
     CommaLocale() : itsPrevious(std::locale::global(std::locale(std::locale(), new CommaPunctuation))) {}

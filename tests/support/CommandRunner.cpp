@@ -1,4 +1,4 @@
-// CommandRunner: runs a program as a user's shell would, and keeps what it printed.
+// CommandRunner: runs a program like a user's shell and captures its output.
 #include "CommandRunner.h"
 
 #include <fcntl.h>

@@ -1,4 +1,4 @@
-// CommandRunner: runs a program as a user's shell would, and keeps what it printed.
+// CommandRunner: runs a program like a user's shell and captures its output.
 #ifndef MORVIK_TESTS_SUPPORT_COMMANDRUNNER_H
 #define MORVIK_TESTS_SUPPORT_COMMANDRUNNER_H
 
@@ -11,14 +11,14 @@
 
 namespace morvik::support {
 
-/// What a finished program leaves behind.
+/// The status and output of a finished program.
 struct CommandResult {
     int status;  // exit status, or minus the number of the signal that ended it
     std::string out;
     std::string err;
 };
 
-/// A program that runs while the test goes on.
+/// A program that runs concurrently with the test.
 class Process {
 public:
     /// Starts it in a directory, with the given descriptors as its standard streams.
@@ -29,17 +29,16 @@ public:
 
     pid_t id() const;
 
-    /// Sends it a signal.
     void send(int signal);
 
-    /// Waits for the end; the status is that of CommandResult.
+    /// Waits for its end and returns the status, as in CommandResult.
     int wait();
 
 private:
     pid_t itsId;
 };
 
-/// Runs a program in a directory of its own, which goes with the runner.
+/// Runs a program in a directory of its own, removed with the runner.
 class CommandRunner {
 public:
     explicit CommandRunner(std::string program);
@@ -50,13 +49,13 @@ public:
     /// Writes a file in the directory.
     void write(const std::string& file, const std::string& text) const;
 
-    /// The content of a file, its name being relative to the directory.
+    /// The content of a file, named relative to the directory.
     std::string read(const std::string& file) const;
 
-    /// The names of all files in the directory that are not hidden, sorted.
+    /// The sorted names of all files in the directory except hidden ones.
     std::vector<std::string> names() const;
 
-    /// Runs the program to its end. An empty `output` keeps the standard output for the result.
+    /// Runs the program to its end. With an empty `output`, standard output is captured in the result.
     CommandResult run(const std::vector<std::string>& arguments,
                       const std::string& input = "/dev/null",
                       const std::string& output = "") const;

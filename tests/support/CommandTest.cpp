@@ -1,4 +1,4 @@
-// CommandTest: what the tests of the command share.
+// CommandTest: fixture and helpers for the tests of the command.
 #include "CommandTest.h"
 
 #include <filesystem>

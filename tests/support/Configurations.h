@@ -1,4 +1,4 @@
-// Configurations: every number of processing units with every algorithm type, for tests that run on all.
+// Configurations: all combinations of processing units and algorithm types, for tests that run on each.
 #ifndef MORVIK_TESTS_SUPPORT_CONFIGURATIONS_H
 #define MORVIK_TESTS_SUPPORT_CONFIGURATIONS_H
 

@@ -1,4 +1,4 @@
-// Environment: numbers that choose another run of a test with random blocks.
+// Environment: numbers from the environment that vary a test with random blocks.
 #ifndef MORVIK_TESTS_SUPPORT_ENVIRONMENT_H
 #define MORVIK_TESTS_SUPPORT_ENVIRONMENT_H
 

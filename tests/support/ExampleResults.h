@@ -8,8 +8,8 @@
 
 namespace morvik::support {
 
-/// A row of K = 40 at so many thousandths of a decibel, of which the frames with a number divisible by 10 have failed
-/// with 7 wrong bits.
+/// A row of K = 40 at an Eb/N0 in thousandths of a decibel. Frames with numbers divisible by 10 have failed with 7
+/// wrong bits.
 inline simulation::ResultRow exampleRow(std::size_t number, int milliDecibels, simulation::FrameRange frames)
 {
     simulation::ResultRow row;

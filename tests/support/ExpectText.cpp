@@ -1,4 +1,4 @@
-// ExpectText: compares a text with what is expected of it, line by line.
+// ExpectText: compares a text with the expected one, line by line.
 #include "ExpectText.h"
 
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-// FailingAllocation: makes a single allocation fail, for programs whose malloc and free are wrapped by the linker.
+// FailingAllocation: makes one allocation fail, in programs whose malloc and free are wrapped by the linker.
 #include "FailingAllocation.h"
 
 #include <cstddef>
@@ -15,7 +15,7 @@ void __wrap_free(void* memory);
 
 namespace {
 
-unsigned untilFailure = 0;  // 0: none is to fail
+unsigned untilFailure = 0;  // 0: none
 long liveBlocks = 0;
 
 void* take(std::size_t size)

@@ -1,4 +1,4 @@
-// FailingAllocation: makes a single allocation fail, for programs whose malloc and free are wrapped by the linker.
+// FailingAllocation: makes one allocation fail, in programs whose malloc and free are wrapped by the linker.
 #ifndef MORVIK_TESTS_SUPPORT_FAILINGALLOCATION_H
 #define MORVIK_TESTS_SUPPORT_FAILINGALLOCATION_H
 
@@ -6,10 +6,10 @@
 #include <streambuf>
 #include <string_view>
 
-/// Blocks of memory that are in use.
+/// The number of memory blocks in use.
 long blocksInUse();
 
-/// A stream buffer that needs no memory: it keeps the first characters and drops the rest.
+/// A stream buffer that allocates nothing: it keeps the first characters and drops the rest.
 class FixedBuffer : public std::streambuf {
 public:
     FixedBuffer()
@@ -31,17 +31,17 @@ private:
     char itsText[4096];
 };
 
-/// Collects the library's lines, and makes an allocation fail, while it lives.
+/// Captures the library's lines and makes an allocation fail, during its lifetime.
 class FailingAllocation {
 public:
-    /// Counted from 1; 0: none is to fail.
+    /// `which`: the allocation to fail, counted from 1; 0 for none.
     explicit FailingAllocation(unsigned which);
     ~FailingAllocation();
 
     FailingAllocation(const FailingAllocation&) = delete;
     FailingAllocation& operator=(const FailingAllocation&) = delete;
 
-    /// Whether the call needed so many allocations at all.
+    /// Whether the call made enough allocations for the failure to happen.
     static bool happened();
 
     std::string_view errors() const

@@ -1,4 +1,4 @@
-// FailureBlock: what the tests of failing allocations decode.
+// FailureBlock: the block that the tests of failing allocations decode.
 #ifndef MORVIK_TESTS_SUPPORT_FAILUREBLOCK_H
 #define MORVIK_TESTS_SUPPORT_FAILUREBLOCK_H
 
@@ -7,7 +7,7 @@
 
 #include "morvik_v1_0_bitacc_cmodel.h"
 
-constexpr unsigned manyAllocations = 100000;  // more than any call needs, less than for ever
+constexpr unsigned manyAllocations = 100000;  // more than any call makes; bounds the loop
 
 inline veltra_ip_morvik_v1_0_generics genericsOf(int algorithm)
 {
@@ -16,7 +16,7 @@ inline veltra_ip_morvik_v1_0_generics genericsOf(int algorithm)
     return generics;
 }
 
-/// A block whose three streams are one, and room for its decisions.
+/// A block with three equal streams, and room for its decisions.
 struct Block {
     std::vector<std::int32_t> stream;
     std::vector<std::uint8_t> bits;

@@ -1,4 +1,4 @@
-// A second formulation of the whole LTE decoder, window by window from the flow of the border metrics: for checking.
+// An independent formulation of the whole LTE decoder for checking, window by window from the flow of border metrics.
 #include "PlainDecoder.h"
 
 #include <algorithm>
@@ -21,8 +21,8 @@ constexpr int highestSoft = 127 * 16;
 constexpr Column unknownState = {0, 0, 0, 0, 0, 0, 0, 0};
 constexpr Column knownStateZero = {0, -16384, -16384, -16384, -16384, -16384, -16384, -16384};
 
-// Places a caller's value in the state format. On the way it is shifted left by eight in a 32-bit word, and what leaves
-// the word is lost: only the value's low 24 bits count.
+// Converts a caller's value to the state format. This includes a left shift by eight in a 32-bit word, so only the
+// value's low 24 bits count.
 int alignedSoft(int value)
 {
     constexpr std::int64_t half = 1 << 23;
@@ -30,12 +30,12 @@ int alignedSoft(int value)
     return 16 * clip(low24, -128, 127);
 }
 
-int stateFormat(int value)  // drops the low bits that the format does not have
+int stateFormat(int value)  // drops the low bits outside the format
 {
     return value & ~0xF;
 }
 
-Column stored(Column column)  // border metrics are kept with seven low bits fewer
+Column stored(Column column)  // border metrics lose their seven low bits
 {
     for (int& metric : column) {
         metric &= ~0x7F;
@@ -49,8 +49,8 @@ struct Constituent {
     std::vector<int> par;
 };
 
-// Sorts the values of the three streams, K + 4 of each. 3GPP TS 36.212, 5.1.3.2.2: the twelve termination values fill
-// the last four positions, one position after the other, as three pairs of systematic and parity value for each code.
+// Separates the values of the three streams, K + 4 each. 3GPP TS 36.212, 5.1.3.2.2: the twelve termination values fill
+// the last four positions, position by position, as three pairs of systematic and parity value for each code.
 std::array<Constituent, 2> constituents(const std::vector<int>& sys,
                                         const std::vector<int>& par1,
                                         const std::vector<int>& par2)
@@ -75,8 +75,8 @@ std::array<Constituent, 2> constituents(const std::vector<int>& sys,
     return codes;
 }
 
-// Each state has one path of three steps that empties the encoder's register. Its metric is the sum of the unclipped
-// branch metrics on it.
+// From each state, one path of three steps empties the encoder's register. Its metric is the sum of its unclipped
+// branch metrics.
 Column terminationColumn(const Constituent& code)
 {
     const std::size_t K = code.sys.size() - tailSteps;
@@ -96,8 +96,8 @@ Column terminationColumn(const Constituent& code)
     return stored(column);
 }
 
-// Decodes one block. Every recursion of every pass leaves the column that it reached beyond its own end under its own
-// name, and every recursion names the one that it starts from: nothing is overwritten.
+// Decodes one block. Every recursion of every pass stores the column beyond its end under a key of its own, and looks
+// up its start column by key: nothing is overwritten.
 class BlockDecoder {
 public:
     BlockDecoder(const Segmentation& cut, const std::array<Constituent, 2>& codes, unsigned algorithm)
@@ -137,7 +137,7 @@ private:
         return itsCodes[1 - pass % 2];
     }
 
-    // The extrinsic values of the pass before, brought into the order of this one; none for the termination.
+    // The extrinsic values of the previous pass in this one's order; none for the termination.
     std::vector<int> aPriori(unsigned pass, const std::vector<int>& extrinsic) const
     {
         std::vector<int> values(itsK + tailSteps);
@@ -161,7 +161,7 @@ private:
         return clip(value, lowestSoft, highestSoft);
     }
 
-    // A segment starts from what its left neighbour reached in the code's previous pass.
+    // A segment starts from the column that its left neighbour reached in the code's previous pass.
     Column forwardStart(unsigned pass, unsigned segment) const
     {
         if (segment == 0) {
@@ -173,9 +173,9 @@ private:
         return stored(itsForwardBorders.at({pass - 2, segment - 1}));
     }
 
-    // A window starts from what its right neighbour in the block reached: in the code's previous pass as a rule. The
-    // last window of a segment finds the value of this pass where there are three rows of windows or more: the hardware
-    // fetches a start column one row ahead, and the first row, where the neighbour lies, is done by then.
+    // A window starts from the column that its right neighbour in the block reached, normally in the code's previous
+    // pass. With three or more rows, the last window of a segment starts from this pass's: the hardware fetches a start
+    // column one row ahead, when the neighbour's row, the first, is already done.
     Column backwardStart(unsigned pass, unsigned row, unsigned segment) const
     {
         const auto rows = static_cast<unsigned>(itsCut.windowOffsets.size());
@@ -200,7 +200,7 @@ private:
             for (unsigned k = first; k < first + itsCut.length; ++k) {
                 g.push_back(values.gamma[k]);
             }
-            g.push_back({});  // for one column more: the one after the segment
+            g.push_back({});  // for one more column, after the segment
             const std::vector<Column> columns = forward(g, forwardStart(pass, segment), itsRule, itsTable);
             std::copy(columns.begin(), columns.end(), &values.alpha[first]);
             itsForwardBorders[{pass, segment}] = columns.back();
@@ -212,7 +212,7 @@ private:
         for (unsigned row = 0; row < itsCut.windowOffsets.size(); ++row) {
             for (unsigned segment = 0; segment < itsCut.segments; ++segment) {
                 const unsigned first = segment * itsCut.length + itsCut.windowOffsets[row];
-                std::vector<BranchColumn> g = {{}};  // for one column more: the one before the window
+                std::vector<BranchColumn> g = {{}};  // for one more column, before the window
                 for (unsigned k = first; k < first + itsCut.windowLengths[row]; ++k) {
                     g.push_back(values.gamma[k]);
                 }

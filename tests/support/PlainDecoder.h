@@ -1,4 +1,4 @@
-// A second formulation of the whole LTE decoder, window by window from the flow of the border metrics: for checking.
+// An independent formulation of the whole LTE decoder for checking, window by window from the flow of border metrics.
 #ifndef MORVIK_TESTS_SUPPORT_PLAINDECODER_H
 #define MORVIK_TESTS_SUPPORT_PLAINDECODER_H
 
@@ -11,10 +11,10 @@ namespace morvik::plain {
 
 bool knownBlockSize(unsigned K);
 
-// Entry i is the position that goes to position i of the interleaved block; empty for an unknown size.
+// Entry i is the source of position i of the interleaved block; empty for an unknown size.
 std::vector<unsigned> permutation(unsigned K);
 
-// The block is cut into segments of equal length, each of them into the same windows.
+// The cut of a block into segments of equal length, each with the same windows.
 struct Segmentation {
     unsigned segments = 0;
     unsigned length = 0;
@@ -22,7 +22,8 @@ struct Segmentation {
     std::vector<unsigned> windowLengths;
 };
 
-// Processors are the processing units times their four threads. Nothing when the segments do not divide the block.
+// `processors` is the number of processing units times their four threads. Returns nullopt if the segments do not
+// divide the block.
 std::optional<Segmentation> segmentation(unsigned K, unsigned processors);
 
 // The values of one soft-in/soft-out pass, in the order of its constituent code.
@@ -42,8 +43,8 @@ struct Result {
     std::vector<Pass> passes;    // two for each iteration; the first one is in interleaved order
 };
 
-// Decodes three streams of K + 4 soft values as the caller of the interface gives them (any int). Algorithm is the
-// type 0, 1 or 2 of the configuration. Nothing when the length of the streams is not one of a block.
+// Decodes three streams of K + 4 soft values as passed to the interface (any int). `algorithm` is the type 0, 1 or 2 of
+// the configuration. Returns nullopt if the streams have no block's length.
 std::optional<Result> decode(const std::vector<int>& sys,
                              const std::vector<int>& par1,
                              const std::vector<int>& par2,

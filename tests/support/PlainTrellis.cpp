@@ -1,4 +1,4 @@
-// The constituent code's trellis and kernels, computed plainly from the encoder's shift register: for checking.
+// The constituent code's trellis and kernels for checking, computed plainly from the encoder's shift register.
 #include "PlainTrellis.h"
 
 #include <algorithm>
@@ -12,7 +12,7 @@ constexpr std::size_t stateCount = 8;
 constexpr unsigned stateFraction = 3;  // fraction bits of the state format
 constexpr unsigned stateShift = 4;     // unused low bits of its 16-bit words
 
-// A metric and the correction of the decision that made it, where that is still to be applied.
+// A metric, and the correction of its decision if still pending.
 struct Metric {
     int value;
     int pending;
@@ -57,8 +57,8 @@ std::size_t branchNumber(unsigned parity0, unsigned parity1)
     return parity0 == 1 ? 3 : 2;
 }
 
-// An edge for a bit of 0 has the negated metric of the edge with all three bits inverted: the hardware clips once, for
-// a bit of 1, and negates afterwards.
+// An edge for a bit of 0 has the negated metric of the edge with all three bits inverted: the hardware clips the metric
+// for a bit of 1 and then negates it.
 int branchMetric(const Transition& edge, const BranchColumn& g)
 {
     if (edge.bit == 1) {
@@ -69,7 +69,7 @@ int branchMetric(const Transition& edge, const BranchColumn& g)
 
 enum class Direction { Forward, Backward };
 
-// One step of a recursion: every state is decided between its edge for a bit of 1 and its edge for a bit of 0.
+// One step of a recursion: every state decides between its edge for a bit of 1 and that for a bit of 0.
 MetricColumn advance(const MetricColumn& old, const BranchColumn& g, Direction direction, const Decider& decide)
 {
     std::array<std::array<Metric, stateCount>, 2> candidates;
@@ -90,7 +90,7 @@ MetricColumn advance(const MetricColumn& old, const BranchColumn& g, Direction d
     return result;
 }
 
-// The metric of the best path through all edges with the given information bit. States 2k and 2k + 1 share branch
+// The metric of the best path through the edges with the given information bit. States 2k and 2k + 1 share branch
 // metric k, which is therefore added after the decision between them.
 int bestPath(const Column& a, const Column& b, const BranchColumn& g, unsigned bit, const Decider& decide)
 {
@@ -108,8 +108,8 @@ int bestPath(const Column& a, const Column& b, const BranchColumn& g, unsigned b
 }  // namespace
 
 // The encoder of 3GPP TS 36.212, 5.1.3.2.1: feedback 1 + D^2 + D^3, parity 1 + D + D^3. The second parity,
-// 1 + D + D^2 + D^3, belongs to the rate-1/5 codes, which share the decoder. The newest register bit is the state's
-// highest.
+// 1 + D + D^2 + D^3, is for the rate-1/5 codes, which share the decoder. The newest register bit is the state's most
+// significant.
 Transition transition(std::size_t state, unsigned bit)
 {
     const auto d1 = static_cast<unsigned>(state >> 2) & 1;
@@ -139,8 +139,7 @@ std::vector<int> correctionTable(unsigned points)
     while ((range >> indexBits) > 1) {
         ++indexBits;
     }
-    // Three of the index bits resolve whole units, the rest fractions of a unit; lower bits of a difference are
-    // ignored.
+    // Three index bits resolve whole units, the rest fractions; lower bits of a difference are ignored.
     const unsigned fraction = indexBits > 3 ? std::min(stateFraction, indexBits - 3) : 0;
     const int step = 1 << (stateFraction + stateShift - fraction);
     const double steps = 1 << stateFraction;

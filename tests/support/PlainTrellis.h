@@ -1,4 +1,4 @@
-// The constituent code's trellis and kernels, computed plainly from the encoder's shift register: for checking.
+// The constituent code's trellis and kernels for checking, computed plainly from the encoder's shift register.
 #ifndef MORVIK_TESTS_SUPPORT_PLAINTRELLIS_H
 #define MORVIK_TESTS_SUPPORT_PLAINTRELLIS_H
 
@@ -8,12 +8,12 @@
 
 namespace morvik::plain {
 
-// All metrics are 16-bit values held in ints, aligned as the state format of 12 bits with 3 fraction bits (Fix_12_3)
-// aligns them: in multiples of 16.
+// All metrics are 16-bit values held in ints, aligned like the state format of 12 bits with 3 fraction bits (Fix_12_3):
+// multiples of 16.
 using Column = std::array<int, 8>;        // one metric for each trellis state
 using BranchColumn = std::array<int, 4>;  // the metrics of the four parity patterns of an information bit of 1
 
-// How a decision between two metrics forms its result.
+// The result of a decision between two metrics.
 enum class Decision {
     Max,      // MOD: the greater one
     MaxStar,  // MOD*: the greater one, plus the correction of this decision
@@ -29,7 +29,7 @@ struct Transition {
     unsigned parity1;
 };
 
-// The edge that an information bit takes from a state.
+// The edge of an information bit from a state.
 Transition transition(std::size_t state, unsigned bit);
 
 // The value modulo 2^16, in -32768 ... 32767.
@@ -38,8 +38,8 @@ int wrap16(int value);
 // The nearest value in low ... high.
 int clip(int value, int low, int high);
 
-// The correction of a decision for every difference d = c1 - c2 of its candidates: entry d + 32768. Points is a power
-// of two, or 0 for 65536; any other number gives an empty table.
+// The correction of a decision for every difference d = c1 - c2 of its candidates, in entry d + 32768. `points` is a
+// power of two, or 0 for 65536; any other number gives an empty table.
 std::vector<int> correctionTable(unsigned points);
 
 BranchColumn branchMetrics(int intrinsic, int parity0, int parity1);

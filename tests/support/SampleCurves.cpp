@@ -1,4 +1,4 @@
-// SampleCurves: made-up error rates for the tests of plots and pages, with everything in them that is drawn.
+// SampleCurves: synthetic error rates for the tests of plots and pages, with every feature that is drawn.
 #include "SampleCurves.h"
 
 #include <algorithm>
@@ -8,7 +8,7 @@ namespace morvik::support {
 
 namespace {
 
-/// A point of which half the errors' intervals are as wide as the number of block errors makes them.
+/// A point whose confidence intervals follow from the number of block errors.
 report::Sample sampleAt(double ebn0, std::uint64_t blocks, std::uint64_t blockErrors)
 {
     constexpr double bitErrorsOfABlock = 30;

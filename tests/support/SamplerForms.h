@@ -1,4 +1,4 @@
-// SamplerForms: for tests that run with every sampler form of this machine.
+// SamplerForms: the sampler forms of this machine, for tests that run with each.
 #ifndef MORVIK_TESTS_SUPPORT_SAMPLERFORMS_H
 #define MORVIK_TESTS_SUPPORT_SAMPLERFORMS_H
 
@@ -11,7 +11,7 @@
 
 namespace morvik::link {
 
-/// What the test library prints of a form.
+/// Prints a form in the test library's messages.
 inline void PrintTo(const SamplerForm& form, std::ostream* out)
 {
     *out << form.name;

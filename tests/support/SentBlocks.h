@@ -1,4 +1,4 @@
-// SentBlocks: the blocks of tests/data/vectors, which another encoder made, with the bits that were sent.
+// SentBlocks: the blocks of tests/data/vectors, made by another encoder, with the bits sent.
 #ifndef MORVIK_TESTS_SUPPORT_SENTBLOCKS_H
 #define MORVIK_TESTS_SUPPORT_SENTBLOCKS_H
 

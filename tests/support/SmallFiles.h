@@ -1,4 +1,4 @@
-// SmallFiles: what a full disk is to a process.
+// SmallFiles: simulates a full disk.
 #ifndef MORVIK_TESTS_SUPPORT_SMALLFILES_H
 #define MORVIK_TESTS_SUPPORT_SMALLFILES_H
 
@@ -7,7 +7,7 @@
 
 namespace morvik::support {
 
-/// Files of this process can have so many bytes for as long as it lives, as if the disk were full then.
+/// Limits the size of this process's files during its lifetime, as if the disk were full.
 class SmallFiles {
 public:
     explicit SmallFiles(rlim_t bytes)

@@ -1,5 +1,5 @@
-// SyntheticFrames: frames whose errors follow from their numbers, without a decoder; and what counting them one at a
-// time gives, which is the definition of what counts at a point.
+// SyntheticFrames: frames whose errors follow from their numbers, without a decoder, and their count one frame at a
+// time, which defines what counts at a point.
 #ifndef MORVIK_TESTS_SUPPORT_SYNTHETICFRAMES_H
 #define MORVIK_TESTS_SUPPORT_SYNTHETICFRAMES_H
 
@@ -17,18 +17,18 @@ class SyntheticFrames {
 public:
     explicit SyntheticFrames(std::uint32_t seed) : itsSeed(seed) {}
 
-    /// Wrong bits of a frame at one of the counts of iterations that are looked at.
+    /// Wrong bits of a frame at one of the iteration counts under test.
     std::uint32_t wrongBits(std::uint64_t frame, std::size_t count) const;
     std::uint32_t clipped(std::uint64_t frame) const;
 
-    /// What comes of a batch.
+    /// The result of a batch.
     simulation::BatchResult result(const simulation::FrameBatch& batch, std::size_t counts) const;
 
 private:
     std::uint32_t itsSeed;
 };
 
-/// Counts the frames of a point one after the other until a rule ends it.
+/// Counts the frames of a point one by one until a stop rule ends it.
 simulation::Tally countOneByOne(const SyntheticFrames& frames,
                                 simulation::FrameRange range,
                                 const simulation::StopRules& rules,

@@ -1,4 +1,4 @@
-// TemporaryFolder: a folder of its own for a test.
+// TemporaryFolder: a temporary folder for a test.
 #include "TemporaryFolder.h"
 
 #include <stdlib.h>
@@ -23,7 +23,7 @@ TemporaryFolder::TemporaryFolder()
 
 TemporaryFolder::~TemporaryFolder()
 {
-    std::error_code ignored;  // what cannot be removed stays among the temporary files
+    std::error_code ignored;  // what cannot be removed stays behind
     std::filesystem::remove_all(itsPath, ignored);
 }
 

@@ -1,4 +1,4 @@
-// TemporaryFolder: a folder of its own for a test.
+// TemporaryFolder: a temporary folder for a test.
 #ifndef MORVIK_TESTS_SUPPORT_TEMPORARYFOLDER_H
 #define MORVIK_TESTS_SUPPORT_TEMPORARYFOLDER_H
 
@@ -7,7 +7,7 @@
 
 namespace morvik::support {
 
-/// An empty folder, which goes with the object and all that is in it.
+/// Creates an empty folder, and removes it with its contents on destruction.
 class TemporaryFolder {
 public:
     TemporaryFolder();
@@ -23,7 +23,7 @@ public:
     void write(const std::string& file, const std::string& text) const;
     std::string read(const std::string& file) const;
 
-    /// The names of all that is in the folder and not hidden, sorted.
+    /// The sorted names of everything in the folder except hidden files.
     std::vector<std::string> names() const;
 
 private:

@@ -1,4 +1,4 @@
-// TraceReader: the values in the text that the model traces.
+// TraceReader: reads the values of the model's trace.
 #include "TraceReader.h"
 
 #include <algorithm>
@@ -18,7 +18,7 @@ bool startsWith(std::string_view text, std::string_view start)
     return text.substr(0, start.size()) == start;
 }
 
-/// Takes the field up to the next blank, and the blanks behind it, from the text.
+/// Removes the field up to the next blank, and the blanks after it, from the text; returns the field.
 std::string_view takeField(std::string_view& text)
 {
     const std::string_view field = text.substr(0, text.find(' '));
@@ -36,7 +36,7 @@ std::optional<Integer> integer(std::string_view digits)
     return result.ec == std::errc() && result.ptr == end ? std::optional<Integer>(value) : std::nullopt;
 }
 
-/// The steps that a field such as "-12.375000" tells: a sign, and six decimals of a multiple of an eighth.
+/// Parses a field such as "-12.375000", a sign and a multiple of an eighth with six decimals, to steps.
 std::optional<std::int16_t> traceValue(std::string_view field)
 {
     constexpr std::uint32_t millionthsInStep = 1000000 / traceStepsInOne;
@@ -58,7 +58,7 @@ std::optional<std::int16_t> traceValue(std::string_view field)
     return static_cast<std::int16_t>(value);
 }
 
-/// Whether a line stands between the passes and their rows and holds no values of them.
+/// Whether a line is one between passes and their rows, without values.
 bool isBetween(std::string_view line)
 {
     constexpr std::array<std::string_view, 6> starts = {

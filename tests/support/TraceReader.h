@@ -1,4 +1,4 @@
-// TraceReader: the values in the text that the model traces.
+// TraceReader: reads the values of the model's trace.
 #ifndef MORVIK_TESTS_SUPPORT_TRACEREADER_H
 #define MORVIK_TESTS_SUPPORT_TRACEREADER_H
 
@@ -18,12 +18,12 @@ constexpr std::array<const char*, 23> traceSignals = {"int", "a0", "a1", "a2", "
                                                       "a7",  "b0", "b1", "b2", "b3", "b4",  "b5", "b6",
                                                       "b7",  "g4", "g5", "g6", "g7", "llr", "ext"};
 
-/// Eighths in 1: values are counted in steps of the state metrics' format, -2048 to 2047.
+/// Steps in 1: values are in steps (eighths) of the state metrics' format, -2048 to 2047.
 constexpr int traceStepsInOne = 8;
 
 /// The values of one trellis step of a pass.
 struct TraceStep {
-    std::uint64_t decode = 0;         ///< decodes that the state had completed before
+    std::uint64_t decode = 0;         ///< decodes completed by the state before
     std::uint32_t halfIteration = 0;  ///< the pass, from 0
     std::uint32_t step = 0;           ///< the trellis step, from 0 to K + 2
     std::array<std::int16_t, traceSignals.size()> values = {};
@@ -31,14 +31,14 @@ struct TraceStep {
 
 /// Reads one trellis step at a time, so that memory does not grow with the trace.
 ///
-/// Input streams, headings and warnings between the rows are skipped. What cannot be read as a trace is thrown as a
-/// base::Error, which opens with the place, NAME:LINE.
+/// Skips input streams, headings and warnings between the rows. Throws base::Error, whose message begins with the
+/// place, NAME:LINE, for anything that is not a trace.
 class TraceReader {
 public:
-    /// `input` outlives the reader; `name` is what messages call it.
+    /// `input` must outlive the reader; `name` names it in messages.
     TraceReader(std::istream& input, std::string name);
 
-    /// Goes to the next trellis step; false at the end.
+    /// Reads the next trellis step; returns false at the end.
     bool next(TraceStep& step);
 
 private:
