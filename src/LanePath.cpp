@@ -10,7 +10,7 @@ using morvik::simulation_call::Status;
 
 namespace {
 
-/// The engine's table, indexed by a quarter of a difference's magnitude in steps: its finest resolution (rule 9).
+/// The engine's table, indexed by a quarter of a difference's magnitude in eighths: its finest resolution (rule 9).
 morvik::lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
 {
     morvik::lanes::CorrectionTable table = {};
