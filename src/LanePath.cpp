@@ -78,7 +78,7 @@ unsigned LanePath::take(const Batch& batch, std::size_t first, unsigned most)
     itsDecisions.resize(taken);
     itsRatios.resize(taken);
     const auto loadAll = [&](const auto& all) {
-        return load(batch, all, first, most);
+        return load(batch, all, first, taken);
     };
     if (!std::visit(loadAll, batch.streams)) {
         loadClipped(batch, first);
@@ -103,9 +103,8 @@ void LanePath::prepare(unsigned K)
 
 /// Returns false if a value is outside the input format: the blocks must then be loaded clipped.
 template <class Input>
-bool LanePath::load(const Batch& batch, const morvik::lanes::Streams<Input>& all, std::size_t first, unsigned most)
+bool LanePath::load(const Batch& batch, const morvik::lanes::Streams<Input>& all, std::size_t first, unsigned taken)
 {
-    const unsigned taken = itsLanes->blocksTaken(most);
     auto& blocks = std::get<Blocks<Input>>(itsBlocks);
     blocks.resize(taken);
     for (unsigned b = 0; b < taken; ++b) {
@@ -113,7 +112,7 @@ bool LanePath::load(const Batch& batch, const morvik::lanes::Streams<Input>& all
     }
     itsIterations = 0;
     itsTaken = taken;
-    return itsLanes->load(blocks.data(), most);
+    return itsLanes->load(blocks.data(), taken);
 }
 
 /// Clips and loads blocks. Warns in the order of single calls: of a block's tag before the next block's values.

@@ -50,7 +50,7 @@ private:
     bool load(const morvik::simulation_call::Batch& batch,
               const morvik::lanes::Streams<Input>& all,
               std::size_t first,
-              unsigned most);
+              unsigned taken);
     void loadClipped(const morvik::simulation_call::Batch& batch, std::size_t first);
     void count(unsigned iterations);
 
