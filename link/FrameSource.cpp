@@ -7,8 +7,8 @@
 #include <stdexcept>
 #include <string>
 
-#include "Channel.h"
-#include "GaussianNumber.h"
+#include "link/channel/Channel.h"
+#include "link/random/GaussianNumber.h"
 #include "rules/Tail.h"
 
 namespace morvik::link {

@@ -6,11 +6,11 @@
 #include <cstdint>
 #include <vector>
 
-#include "Random.h"
-#include "RandomBatch.h"
-#include "SamplerForm.h"
-#include "SoftValueSampler.h"
-#include "TurboEncoder.h"
+#include "link/channel/SoftValueSampler.h"
+#include "link/coding/TurboEncoder.h"
+#include "link/random/Random.h"
+#include "link/random/RandomBatch.h"
+#include "link/random/SamplerForm.h"
 
 namespace morvik::link {
 

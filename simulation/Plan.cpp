@@ -11,7 +11,7 @@
 
 #include "base/Numbers.h"
 #include "base/Shown.h"
-#include "link/DefaultScale.h"
+#include "link/channel/DefaultScale.h"
 
 namespace morvik::simulation {
 

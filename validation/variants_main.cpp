@@ -13,11 +13,11 @@
 #include <string>
 #include <vector>
 
-#include "link/Channel.h"
-#include "link/DefaultScale.h"
-#include "link/GaussianNumber.h"
-#include "link/Random.h"
-#include "link/TurboEncoder.h"
+#include "link/channel/Channel.h"
+#include "link/channel/DefaultScale.h"
+#include "link/coding/TurboEncoder.h"
+#include "link/random/GaussianNumber.h"
+#include "link/random/Random.h"
 #include "rules/Tail.h"
 #include "src/TDecoder3G.h"
 

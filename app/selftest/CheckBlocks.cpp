@@ -4,7 +4,7 @@
 #include <cstdio>
 
 #include "link/FrameSource.h"
-#include "link/Random.h"
+#include "link/random/Random.h"
 #include "rules/BlockSizes.h"
 #include "rules/Tail.h"
 

@@ -18,7 +18,7 @@
 #include <string>
 
 #include "bindings/Listener.h"
-#include "link/TurboEncoder.h"
+#include "link/coding/TurboEncoder.h"
 #include "morvik_v1_0_batch.h"
 #include "rules/Tail.h"
 

@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "link/TurboEncoder.h"
+#include "link/coding/TurboEncoder.h"
 #include "rules/BlockSizes.h"
 
 namespace morvik::diagnosis {

@@ -6,8 +6,8 @@
 #include <utility>
 
 #include "hardware/testbench/SoftBlock.h"
-#include "link/DefaultScale.h"
 #include "link/FrameSource.h"
+#include "link/channel/DefaultScale.h"
 #include "rules/BlockSizes.h"
 #include "rules/Cut.h"
 #include "rules/SoftValues.h"

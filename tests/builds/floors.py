@@ -14,17 +14,26 @@ BELOW = {
     "base": "",
     "lanes": "rules",
     "src": "lanes rules",
-    "link": "rules",
-    "simulation": "base link rules",
+    "link/random": "",
+    "link/coding": "rules",
+    "link/modulation": "",
+    "link/channel": "link/random rules",
+    "link": "link/channel link/coding link/modulation link/random rules",
+    "simulation": "base link link/channel rules",
     "report": "base simulation rules",
     "hardware/testbench": "src rules",
     "hardware/tables": "base",
-    "hardware/vectors": "base hardware/tables hardware/testbench link rules",
+    "hardware/vectors": "base hardware/tables hardware/testbench link link/channel rules",
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
-    "hardware/diagnosis": "base hardware/testbench link rules simulation",
-    "validation": "link rules src",
+    "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
+    "validation": "link/channel link/coding link/random rules src",
 }
+
+
+def floor_of(path):
+    """The folder of the table that a file belongs to."""
+    return next(str(parent) for parent in path.parents if str(parent) in BELOW)
 
 
 def main():
@@ -33,7 +42,8 @@ def main():
     mistakes = []
     for folder, below in BELOW.items():
         allowed = {folder, *below.split()}
-        sources = (path for path in (root / folder).rglob("*") if path.suffix in (".h", ".cpp", ".def", ".in"))
+        sources = (path for path in (root / folder).rglob("*") if path.suffix in (".h", ".cpp", ".def", ".in")
+                   and floor_of(path.relative_to(root)) == folder)
         for path in sources:
             for header in re.findall(r'^#include "([^"]+)"', path.read_text(), re.MULTILINE):
                 # A bare name is a neighbour, or a header of include/.

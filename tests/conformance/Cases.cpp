@@ -5,8 +5,8 @@
 #include <sstream>
 #include <stdexcept>
 
-#include "link/DefaultScale.h"
 #include "link/FrameSource.h"
+#include "link/channel/DefaultScale.h"
 
 namespace morvik::conformance {
 

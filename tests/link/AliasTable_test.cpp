@@ -1,5 +1,5 @@
 // AliasTable: tests that every value is drawn with its exact probability.
-#include "link/AliasTable.h"
+#include "link/random/AliasTable.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
 // BitMatrix: tests of the transposition.
-#include "link/BitMatrix.h"
+#include "link/coding/BitMatrix.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
 // Channel: tests of the noise and of the distribution of what the quantiser makes of it.
-#include "link/Channel.h"
+#include "link/channel/Channel.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
 // DefaultScale: tests of the rule, and that it holds for the decoder.
-#include "link/DefaultScale.h"
+#include "link/channel/DefaultScale.h"
 
 #include <gtest/gtest.h>
 

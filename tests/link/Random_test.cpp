@@ -1,11 +1,11 @@
 // Random: tests of the random numbers of a frame, one by one and in bulk.
-#include "link/Random.h"
+#include "link/random/Random.h"
 
 #include <gtest/gtest.h>
 
 #include <set>
 
-#include "link/SamplerForm.h"
+#include "link/random/SamplerForm.h"
 
 namespace {
 

@@ -1,5 +1,5 @@
 // SamplerForm: tests of every way to draw values against the definition.
-#include "link/SamplerForm.h"
+#include "link/random/SamplerForm.h"
 
 #include <gtest/gtest.h>
 
@@ -8,7 +8,7 @@
 #include <random>
 #include <string>
 
-#include "link/Channel.h"
+#include "link/channel/Channel.h"
 
 #include "support/SamplerForms.h"
 

@@ -1,5 +1,5 @@
 // SoftValueSampler: tests of the drawn values, one by one and as a whole.
-#include "link/SoftValueSampler.h"
+#include "link/channel/SoftValueSampler.h"
 
 #include <gtest/gtest.h>
 

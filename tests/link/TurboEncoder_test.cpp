@@ -1,5 +1,5 @@
 // TurboEncoder: tests against a plain encoder, another one's blocks, the decoder, and the code's algebra.
-#include "link/TurboEncoder.h"
+#include "link/coding/TurboEncoder.h"
 
 #include <gtest/gtest.h>
 

@@ -7,7 +7,7 @@
 #include <ostream>
 #include <string>
 
-#include "link/SamplerForm.h"
+#include "link/random/SamplerForm.h"
 
 namespace morvik::link {
 

@@ -2,8 +2,8 @@
 //
 // The generator is Philox4x32-10 of Random123. Its key is the seed; its counter holds the frame, the point and an
 // index, and gives 128 bits. So a frame does not depend on what was drawn before, or by which thread.
-#ifndef MORVIK_LINK_RANDOM_H
-#define MORVIK_LINK_RANDOM_H
+#ifndef MORVIK_LINK_RANDOM_RANDOM_H
+#define MORVIK_LINK_RANDOM_RANDOM_H
 
 #include <Random123/philox.h>
 

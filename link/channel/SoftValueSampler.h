@@ -1,16 +1,16 @@
 // SoftValueSampler: draws the soft values of transmitted bits directly from their distribution.
-#ifndef MORVIK_LINK_SOFTVALUESAMPLER_H
-#define MORVIK_LINK_SOFTVALUESAMPLER_H
+#ifndef MORVIK_LINK_CHANNEL_SOFTVALUESAMPLER_H
+#define MORVIK_LINK_CHANNEL_SOFTVALUESAMPLER_H
 
 #include <cstddef>
 #include <cstdint>
 #include <vector>
 
-#include "AliasTable.h"
 #include "Channel.h"
-#include "Random.h"
-#include "RandomBatch.h"
-#include "SamplerForm.h"
+#include "link/random/AliasTable.h"
+#include "link/random/Random.h"
+#include "link/random/RandomBatch.h"
+#include "link/random/SamplerForm.h"
 
 namespace morvik::link {
 

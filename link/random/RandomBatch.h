@@ -1,6 +1,6 @@
 // RandomBatch: random blocks drawn together.
-#ifndef MORVIK_LINK_RANDOMBATCH_H
-#define MORVIK_LINK_RANDOMBATCH_H
+#ifndef MORVIK_LINK_RANDOM_RANDOMBATCH_H
+#define MORVIK_LINK_RANDOM_RANDOMBATCH_H
 
 #include <cstddef>
 #include <cstdint>

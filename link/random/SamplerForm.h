@@ -1,6 +1,6 @@
 // SamplerForm: the implementations of drawing quantised values, one for each instruction set that has its own.
-#ifndef MORVIK_LINK_SAMPLERFORM_H
-#define MORVIK_LINK_SAMPLERFORM_H
+#ifndef MORVIK_LINK_RANDOM_SAMPLERFORM_H
+#define MORVIK_LINK_RANDOM_SAMPLERFORM_H
 
 #include <cstddef>
 #include <cstdint>

@@ -1,6 +1,6 @@
 // BitMatrix: transposes 64 by 64 bits, between words of one block and words that hold one position of 64 blocks.
-#ifndef MORVIK_LINK_BITMATRIX_H
-#define MORVIK_LINK_BITMATRIX_H
+#ifndef MORVIK_LINK_CODING_BITMATRIX_H
+#define MORVIK_LINK_CODING_BITMATRIX_H
 
 #include <array>
 #include <cstddef>

@@ -1,6 +1,6 @@
 // SamplerFormX86: draws quantised values with vector instructions.
-#ifndef MORVIK_LINK_SAMPLERFORMX86_H
-#define MORVIK_LINK_SAMPLERFORMX86_H
+#ifndef MORVIK_LINK_RANDOM_SAMPLERFORMX86_H
+#define MORVIK_LINK_RANDOM_SAMPLERFORMX86_H
 
 #include "SamplerForm.h"
 

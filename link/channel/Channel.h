@@ -2,13 +2,13 @@
 //
 // A bit 1 is sent as +1 and a bit 0 as -1. A soft value is the received value times a scale, rounded and clipped to
 // -128 ... 127.
-#ifndef MORVIK_LINK_CHANNEL_H
-#define MORVIK_LINK_CHANNEL_H
+#ifndef MORVIK_LINK_CHANNEL_CHANNEL_H
+#define MORVIK_LINK_CHANNEL_CHANNEL_H
 
 #include <array>
 #include <cstdint>
 
-#include "AliasTable.h"
+#include "link/random/AliasTable.h"
 
 namespace morvik::link {
 

@@ -1,6 +1,6 @@
 // GaussianNumber: a standard Gaussian number (the method of Box and Muller).
-#ifndef MORVIK_LINK_GAUSSIANNUMBER_H
-#define MORVIK_LINK_GAUSSIANNUMBER_H
+#ifndef MORVIK_LINK_RANDOM_GAUSSIANNUMBER_H
+#define MORVIK_LINK_RANDOM_GAUSSIANNUMBER_H
 
 #include <cmath>
 

@@ -1,6 +1,6 @@
 // DefaultScale: the default scale, in steps of a soft value for amplitude 1.
-#ifndef MORVIK_LINK_DEFAULTSCALE_H
-#define MORVIK_LINK_DEFAULTSCALE_H
+#ifndef MORVIK_LINK_CHANNEL_DEFAULTSCALE_H
+#define MORVIK_LINK_CHANNEL_DEFAULTSCALE_H
 
 namespace morvik::link {
 

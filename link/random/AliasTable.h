@@ -1,6 +1,6 @@
 // AliasTable: draws one of 256 values in constant time, with exact probabilities (alias method of Walker and Vose).
-#ifndef MORVIK_LINK_ALIASTABLE_H
-#define MORVIK_LINK_ALIASTABLE_H
+#ifndef MORVIK_LINK_RANDOM_ALIASTABLE_H
+#define MORVIK_LINK_RANDOM_ALIASTABLE_H
 
 #include <array>
 #include <cstdint>

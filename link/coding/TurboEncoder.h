@@ -1,6 +1,6 @@
 // TurboEncoder: the turbo encoder of 3GPP TS 36.212, clause 5.1.3.2, for up to 64 blocks at once.
-#ifndef MORVIK_LINK_TURBOENCODER_H
-#define MORVIK_LINK_TURBOENCODER_H
+#ifndef MORVIK_LINK_CODING_TURBOENCODER_H
+#define MORVIK_LINK_CODING_TURBOENCODER_H
 
 #include <array>
 #include <cstddef>
