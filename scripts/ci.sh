@@ -2,7 +2,7 @@
 # Runs the stages of continuous integration locally, all or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew mutate packages starts memory-short
+# named: abi-renew mutate packages starts memory-short lint-short
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -16,8 +16,15 @@ stage_format() {
 
 stage_lint() {
     tidy {base,src,lanes,link,simulation,report,hardware,validation,app,bindings}/'*.cpp'
-    cppcheck --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
+    cppcheck -j "$(nproc)" --quiet --error-exitcode=1 --std=c++17 --enable=warning,performance,portability --inline-suppr \
         --suppress=internalAstError -I include -I src -I . base src link simulation report hardware validation app
+}
+
+# The analyzer leaves a function after 20,000 of its states instead of 225,000, which saves a third of the time.
+stage_lint-short() {
+    analyzer=(--extra-arg={-Xclang,-analyzer-config,-Xclang,max-nodes=20000})
+    stage_lint
+    analyzer=()
 }
 
 # Takes as long as all other stages together.
@@ -25,17 +32,18 @@ stage_lint-tests() {
     tidy {tests,bench}/'*.cpp'
 }
 
+analyzer=()
 tidy() {
     scripts/build x86_64
     # Standard error has the number of suppressed warnings, and the reason if it could not run.
     local log=build/x86_64/lint.log
-    # Removes flags unknown to clang from the commands.
+    # Removes what is g++'s own from the commands: flags, and precompiled headers.
     mkdir -p build/lint
-    sed 's/ -fno-tree-[a-z]*//g' build/x86_64/compile_commands.json >build/lint/compile_commands.json
+    sed -E 's/ -fno-tree-[a-z]*//g; s/ -Winvalid-pch -include [^ ]*cmake_pch.hxx//' build/x86_64/compile_commands.json >build/lint/compile_commands.json
     # A unit of bench/ needs a package that is not installed here, and Octave's own compiler builds its function.
     git ls-files "$@" |
         grep -vxE 'bench/ItppDecoding\.cpp|bindings/octave/morvik_mex\.cpp' |
-        xargs -P "$(nproc)" -n 4 clang-tidy -p build/lint --quiet 2>"$log" || { cat "$log" >&2; return 1; }
+        xargs -P "$(nproc)" -n 4 clang-tidy -p build/lint --quiet "${analyzer[@]}" 2>"$log" || { cat "$log" >&2; return 1; }
 }
 
 # The documents' site, warnings as errors. A separate test runs their code blocks.
@@ -129,7 +137,7 @@ stage_threads() {
 stage_hostile() {
     local fuzzers
     mapfile -t fuzzers < <(sed -n '/^foreach(fuzzer/,/)$/s/^ *\([a-z_]*_fuzz\).*/\1/p' tests/fuzz/CMakeLists.txt)
-    scripts/build fuzz "${fuzzers[@]}"
+    scripts/build sanitize "${fuzzers[@]}"
     local corpus=${HOSTILE_CORPUS:-}
     if [ -z "$corpus" ]; then
         corpus=$(mktemp -d)
@@ -142,11 +150,11 @@ stage_hostile() {
 # fuzz CORPUS FUZZER
 fuzz() {
     local limit=(-runs=4000 -seed=36212)
-    local log=build/fuzz/$2.log
+    local log=build/sanitize/$2.log
     [ -z "${HOSTILE_SECONDS:-}" ] || limit=(-max_total_time="$HOSTILE_SECONDS")
     [ ! -e "tests/fuzz/dictionaries/$2.dict" ] || limit+=(-dict="tests/fuzz/dictionaries/$2.dict")
     mkdir -p "$1/$2"
-    "build/fuzz/tests/$2" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/fuzz/" \
+    "build/sanitize/tests/$2" "${limit[@]}" -max_len=4096 -print_final_stats=1 -artifact_prefix="$PWD/build/sanitize/" \
         "$1/$2" "tests/fuzz/corpus/$2" >"$log" 2>&1 || { tail -n 60 "$log"; return 1; }
     echo "$2: $(sed -n 's/.*number_of_executed_units: *//p' "$log") executions"
 }
@@ -202,7 +210,7 @@ scripts/setup --checks --tests
 [ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads hostile coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads hostile coverage tests abi-renew mutate packages starts memory-short" >&2
+        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads hostile coverage tests abi-renew mutate packages starts memory-short lint-short" >&2
         exit 2
     fi
     echo "== $stage"

@@ -2,6 +2,7 @@
 
 import os
 import re
+import shlex
 import subprocess
 import sys
 from pathlib import Path
@@ -28,6 +29,7 @@ class CMakeBuild(build_ext):
             "Python3_EXECUTABLE": sys.executable,
         }
         definitions = [f"-D{name}={value}" for name, value in options.items()]
+        definitions += shlex.split(os.environ.get("CMAKE_ARGS", ""))
         subprocess.run(["cmake", "-S", ROOT, "-B", build, "-G", "Ninja", *definitions], check=True)
         jobs = str(self.parallel or len(os.sched_getaffinity(0)))
         subprocess.run(["cmake", "--build", build, "--target", "morvik_python", "--parallel", jobs], check=True)
