@@ -7,23 +7,9 @@
 #include <cstdint>
 #include <vector>
 
+#include "PackedBits.h"
+
 namespace morvik::link {
-
-/// Consecutive blocks of bits, each in `words` words: bit i of a block is bit i % 64 of its word i / 64.
-struct PackedBlocks {
-    std::size_t words = 0;
-    std::vector<std::uint64_t> bits;
-
-    std::uint64_t* block(unsigned b)
-    {
-        return &bits[b * words];
-    }
-
-    const std::uint64_t* block(unsigned b) const
-    {
-        return &bits[b * words];
-    }
-};
 
 class TurboEncoder {
 public:

@@ -1,0 +1,69 @@
+// PackedBits: rows of bits, 64 to a word.
+#include "PackedBits.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace morvik::link {
+
+namespace {
+
+constexpr std::uint64_t everyByte = 0x0101010101010101;
+
+/// Bit j of the result is the lowest bit of byte j.
+std::uint64_t packEight(const std::uint8_t* bytes)
+{
+    std::uint64_t eight;
+    std::memcpy(&eight, bytes, sizeof eight);
+    // Byte j moves to bit 56 + j; the other products stay below bit 56 or leave the word.
+    return (eight & everyByte) * 0x0102040810204080 >> 56;
+}
+
+/// Byte j of the result is bit j.
+std::uint64_t spreadEight(std::uint64_t bits)
+{
+    // Byte j keeps bit j of the eight; adding 127 moves it to the top, whichever it was.
+    const std::uint64_t eight = (bits & 0xFF) * everyByte & 0x8040201008040201;
+    return (eight + 0x7F * everyByte) >> 7 & everyByte;
+}
+
+}  // namespace
+
+void copyBits(const std::uint64_t* from, std::size_t first, std::size_t count, std::uint64_t* row, std::size_t to)
+{
+    while (count > 0) {
+        const std::size_t shift = to % 64;
+        const std::size_t now = std::min(count, 64 - shift);
+        std::uint64_t& word = row[to / 64];
+        word = (word & ~(lowBits(now) << shift)) | bitsAt(from, first, now) << shift;
+        first += now;
+        to += now;
+        count -= now;
+    }
+}
+
+void packBits(const std::uint8_t* bytes, std::size_t count, std::uint64_t* row)
+{
+    std::fill_n(row, wordsOf(count), 0);
+    const std::size_t whole = count / 8 * 8;
+    for (std::size_t i = 0; i < whole; i += 8) {
+        row[i / 64] |= packEight(bytes + i) << i % 64;
+    }
+    for (std::size_t i = whole; i < count; ++i) {
+        row[i / 64] |= std::uint64_t{bytes[i] & 1U} << i % 64;
+    }
+}
+
+void unpackBits(const std::uint64_t* row, std::size_t count, std::uint8_t* bytes)
+{
+    const std::size_t whole = count / 8 * 8;
+    for (std::size_t i = 0; i < whole; i += 8) {
+        const std::uint64_t eight = spreadEight(row[i / 64] >> i % 64);
+        std::memcpy(bytes + i, &eight, sizeof eight);
+    }
+    for (std::size_t i = whole; i < count; ++i) {
+        bytes[i] = static_cast<std::uint8_t>(row[i / 64] >> i % 64 & 1);
+    }
+}
+
+}  // namespace morvik::link

@@ -1,0 +1,76 @@
+// RateMatching: rate matching of one code block and its reverse: 3GPP TS 36.212, clause 5.1.4.1.
+//
+// The circular buffer is kept without its dummy and filler bits (<NULL>): what a transmission sends is then a run of it
+// that may wrap around, and the buffer's bits stand in the same order for every redundancy version.
+#ifndef MORVIK_LINK_CODING_RATEMATCHING_H
+#define MORVIK_LINK_CODING_RATEMATCHING_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <limits>
+#include <vector>
+
+namespace morvik::link {
+
+/// Redundancy versions are 0 to 3.
+constexpr unsigned redundancyVersions = 4;
+
+/// A soft buffer that holds whole code blocks.
+constexpr unsigned unlimitedBuffer = std::numeric_limits<unsigned>::max();
+
+class RateMatching {
+public:
+    /// K             one of the 188 block sizes
+    /// fillers       filler bits at its start, fewer than K (F)
+    /// bufferSize    positions of the circular buffer, dummy and filler bits included, or unlimitedBuffer (N_cb)
+    ///
+    /// Throws std::invalid_argument for other values, and where the buffer has no bit of the block.
+    RateMatching(unsigned K, unsigned fillers, unsigned bufferSize = unlimitedBuffer);
+
+    /// Bits of the circular buffer, without dummy and filler bits.
+    unsigned size() const
+    {
+        return static_cast<unsigned>(itsPositions.size());
+    }
+
+    /// Where a redundancy version starts in it (k_0).
+    unsigned start(unsigned version) const
+    {
+        return itsStarts[version];
+    }
+
+    /// Of each bit of the circular buffer: its stream times K + 4, plus its position there.
+    const std::vector<std::uint16_t>& positions() const
+    {
+        return itsPositions;
+    }
+
+    /// Puts the three packed streams of K + 4 bits into a packed circular buffer.
+    void interleave(const std::array<const std::uint64_t*, 3>& streams, std::uint64_t* buffer) const;
+
+    /// Writes `count` bits (E) of a redundancy version to a packed row, from bit `to` on.
+    void select(
+        const std::uint64_t* buffer, unsigned version, std::size_t count, std::uint64_t* row, std::size_t to) const;
+
+    /// Adds `count` received values to a soft buffer of size() values.
+    void recover(const float* received, unsigned version, std::size_t count, float* buffer) const;
+
+    /// The same in whole steps, each sum clipped to `width` bits, 2 to 16.
+    void recover(
+        const std::int16_t* received, unsigned version, std::size_t count, unsigned width, std::int16_t* buffer) const;
+
+    /// Puts soft values of the circular buffer into the three streams of K + 4 values: filler bits as `filler`, what
+    /// the buffer does not hold as 0.
+    void deinterleave(const std::int8_t* buffer, std::int8_t filler, const std::array<std::int8_t*, 3>& streams) const;
+
+private:
+    unsigned itsK;
+    unsigned itsFillers;
+    std::array<unsigned, redundancyVersions> itsStarts{};
+    std::vector<std::uint16_t> itsPositions;
+};
+
+}  // namespace morvik::link
+
+#endif
