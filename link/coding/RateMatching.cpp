@@ -72,7 +72,7 @@ RateMatching::RateMatching(unsigned K, unsigned fillers, unsigned bufferSize) : 
         buffer.resize(bufferSize);
     }
     const auto bitsBefore = [&buffer](unsigned end) {
-        return static_cast<unsigned>(end - std::count(buffer.begin(), buffer.begin() + end, null));
+        return end - static_cast<unsigned>(std::count(buffer.data(), buffer.data() + end, null));
     };
     const auto total = static_cast<unsigned>(buffer.size());
     if (bitsBefore(total) == 0) {
@@ -127,13 +127,12 @@ void RateMatching::recover(
     });
 }
 
-void RateMatching::deinterleave(const std::int8_t* buffer,
-                                std::int8_t filler,
-                                const std::array<std::int8_t*, 3>& streams) const
+template <typename Value>
+void RateMatching::deinterleave(const Value* buffer, Value filler, const std::array<Value*, 3>& streams) const
 {
     const unsigned length = itsK + rules::tailPositions;
-    for (std::int8_t* const stream : streams) {
-        std::fill_n(stream, length, std::int8_t{0});
+    for (Value* const stream : streams) {
+        std::fill_n(stream, length, Value{0});
     }
     std::fill_n(streams[0], itsFillers, filler);
     std::fill_n(streams[1], itsFillers, filler);
@@ -141,5 +140,10 @@ void RateMatching::deinterleave(const std::int8_t* buffer,
         streams[itsPositions[n] / length][itsPositions[n] % length] = buffer[n];
     }
 }
+
+template void RateMatching::deinterleave(const float* buffer, float filler, const std::array<float*, 3>& streams) const;
+template void RateMatching::deinterleave(const std::int8_t* buffer,
+                                         std::int8_t filler,
+                                         const std::array<std::int8_t*, 3>& streams) const;
 
 }  // namespace morvik::link

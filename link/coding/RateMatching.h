@@ -61,8 +61,9 @@ public:
         const std::int16_t* received, unsigned version, std::size_t count, unsigned width, std::int16_t* buffer) const;
 
     /// Puts soft values of the circular buffer into the three streams of K + 4 values: filler bits as `filler`, what
-    /// the buffer does not hold as 0.
-    void deinterleave(const std::int8_t* buffer, std::int8_t filler, const std::array<std::int8_t*, 3>& streams) const;
+    /// the buffer does not hold as 0. Value is float or std::int8_t.
+    template <typename Value>
+    void deinterleave(const Value* buffer, Value filler, const std::array<Value*, 3>& streams) const;
 
 private:
     unsigned itsK;

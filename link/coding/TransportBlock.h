@@ -53,6 +53,12 @@ public:
         return itsKinds[itsKindOf[r]];
     }
 
+    /// The first bit of the transport block and its CRC that code block r carries.
+    std::size_t payloadOffset(unsigned r) const
+    {
+        return itsPayloadOffsets[r];
+    }
+
     /// Words of the packed circular buffers of one transport block; they stand one after the other, each from a new
     /// word on.
     std::size_t bufferWords() const
