@@ -34,8 +34,7 @@ void copyBits(const std::uint64_t* from, std::size_t first, std::size_t count, s
     while (count > 0) {
         const std::size_t shift = to % 64;
         const std::size_t now = std::min(count, 64 - shift);
-        std::uint64_t& word = row[to / 64];
-        word = (word & ~(lowBits(now) << shift)) | bitsAt(from, first, now) << shift;
+        row[to / 64] = (row[to / 64] & ~(lowBits(now) << shift)) | bitsAt(from, first, now) << shift;
         first += now;
         to += now;
         count -= now;

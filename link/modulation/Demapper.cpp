@@ -21,14 +21,15 @@ float expOfMinus(float x)
     constexpr float log2e = 1.44269504F;
     constexpr float ln2High = 0.693145752F;  // few bits, so that its multiples are exact
     constexpr float ln2Low = 1.42860677e-6F;
-    const auto halvings = static_cast<std::int32_t>(x * log2e + 0.5F);
-    const auto n = static_cast<float>(halvings);
+    constexpr float magic = 12582912;  // 1.5 * 2^23: a float that is added to it loses its fraction
+    const float n = (x * log2e + magic) - magic;
+    const auto halvings = static_cast<std::uint32_t>(n);
     const float rest = (n * ln2High - x) + n * ln2Low;  // from -ln 2 / 2 to ln 2 / 2
     float power = 1.0F / 720;
     for (const float factor : {1.0F / 120, 1.0F / 24, 1.0F / 6, 0.5F, 1.0F, 1.0F}) {
         power = power * rest + factor;
     }
-    const auto bits = static_cast<std::uint32_t>(127 - halvings) << 23;  // 2^-halvings
+    const auto bits = (127 - halvings) << 23;  // 2^-halvings
     float scale;
     std::memcpy(&scale, &bits, sizeof scale);
     return power * scale;
@@ -135,12 +136,12 @@ void demapSymbols(Modulation modulation,
                   float* ratios)
 {
     const unsigned m = bitsPerDimension(modulation);
-    const unsigned across = dimensions(modulation);
+    const std::size_t across = dimensions(modulation);
     const float unit = unitAmplitude(modulation);
     // With BPSK, a 1 is the positive level.
-    const float slope = (modulation == Modulation::bpsk ? -2 : 2) * unit / noiseVariance;
+    const float slope = (modulation == Modulation::bpsk ? -2.0F : 2.0F) * unit / noiseVariance;
     const float energy = unit * unit / noiseVariance;
-    for (std::size_t n = 0; n < across * count; ++n) {
+    for (std::size_t n = 0; n < count * across; ++n) {
         const float gain = gains == nullptr ? 1 : gains[n / across];
         std::array<float, mostBits> own{};
         if (demapper == Demapper::maxLog) {

@@ -12,8 +12,8 @@ int level(unsigned bits, unsigned m)
         return (bits >> i & 1) != 0 ? -1 : 1;
     };
     int magnitude = 1;
-    for (unsigned i = m - 1; i > 0; --i) {
-        magnitude = (1 << (m - i)) - sign(i) * magnitude;
+    for (unsigned i = 1; i < m; ++i) {
+        magnitude = (1 << i) - sign(m - i) * magnitude;
     }
     return sign(0) * magnitude;
 }
@@ -23,9 +23,9 @@ int level(unsigned bits, unsigned m)
 void mapSymbols(Modulation modulation, const std::uint64_t* bits, std::size_t count, float* symbols)
 {
     const unsigned m = bitsPerDimension(modulation);
-    const unsigned across = dimensions(modulation);
+    const std::size_t across = dimensions(modulation);
     const float unit = modulation == Modulation::bpsk ? -unitAmplitude(modulation) : unitAmplitude(modulation);
-    for (std::size_t n = 0; n < across * count; ++n) {
+    for (std::size_t n = 0; n < count * across; ++n) {
         const std::size_t first = n / across * bitsPerSymbol(modulation) + n % across;
         unsigned own = 0;
         for (unsigned i = 0; i < m; ++i) {

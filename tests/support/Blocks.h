@@ -17,6 +17,12 @@ using Random = std::mt19937;
 /// A number from `first` to `last`.
 int between(Random& random, int first, int last);
 
+/// A number below `count`.
+inline unsigned below(Random& random, unsigned count)
+{
+    return static_cast<unsigned>(random() % count);
+}
+
 using Stream = std::vector<std::int32_t>;
 
 /// The three streams of a block for the C interface, K + 4 values each.
