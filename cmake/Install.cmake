@@ -1,18 +1,17 @@
-# The layout of `cmake --install`: the library with its headers, CMake package and pkg-config file, the command with its
-# manual pages and completions, and the pages of docs/. All paths are relative, so an installed tree can be moved. If
-# only the library is built, `cmake --install FOLDER --component library` installs it alone. packaging/ has Debian's
-# layout.
+# The layout of `cmake --install`: the libraries with their headers, CMake packages and pkg-config files, the command with
+# its manual pages and completions, and the pages of docs/. All paths are relative, so an installed tree can be moved. If
+# only the model is built, `cmake --install FOLDER --component library` installs it alone; so does `link` with the LTE
+# chain. packaging/ has Debian's layout.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 set(library morvik_v1_0_bitacc_cmodel)
-set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/${library})
 
 set(CMAKE_INSTALL_DEFAULT_COMPONENT_NAME library)
 set_target_properties(morvik_classes PROPERTIES EXPORT_NAME classes)
 install(TARGETS ${library} morvik_classes EXPORT ${library}
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
-install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} PATTERN morvik_link.h EXCLUDE)
 install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 
 # The class headers and those that they include. Their names are common, so they have a folder of their own.
@@ -53,12 +52,25 @@ endforeach()
 install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT documents
     FILES_MATCHING PATTERN *.md PATTERN *.svg PATTERN *.png)
 
-install(EXPORT ${library} NAMESPACE morvik:: FILE ${library}Config.cmake DESTINATION ${package_dir})
-# A consumer of the other word size gets a message rather than a linker error.
-write_basic_package_version_file(${PROJECT_BINARY_DIR}/${library}ConfigVersion.cmake COMPATIBILITY SameMajorVersion)
-install(FILES ${PROJECT_BINARY_DIR}/${library}ConfigVersion.cmake DESTINATION ${package_dir})
+set_target_properties(morvik_link_c PROPERTIES EXPORT_NAME morvik_link)
+install(TARGETS morvik_link_c EXPORT morvik_link
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT link
+    INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+install(FILES include/morvik_link.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT link)
 
+# What finds a library: a CMake package and a pkg-config file. A consumer of the other word size gets a message rather
+# than a linker error.
 cmake_path(RELATIVE_PATH CMAKE_INSTALL_PREFIX BASE_DIRECTORY ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig
     OUTPUT_VARIABLE pc_to_prefix)
-configure_file(cmake/${library}.pc.in ${PROJECT_BINARY_DIR}/${library}.pc @ONLY)
-install(FILES ${PROJECT_BINARY_DIR}/${library}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+function(install_finders name component)
+    install(EXPORT ${name} NAMESPACE morvik:: FILE ${name}Config.cmake
+        DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/${name} COMPONENT ${component})
+    write_basic_package_version_file(${PROJECT_BINARY_DIR}/${name}ConfigVersion.cmake COMPATIBILITY SameMajorVersion)
+    install(FILES ${PROJECT_BINARY_DIR}/${name}ConfigVersion.cmake
+        DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/${name} COMPONENT ${component})
+    configure_file(cmake/${name}.pc.in ${PROJECT_BINARY_DIR}/${name}.pc @ONLY)
+    install(FILES ${PROJECT_BINARY_DIR}/${name}.pc
+        DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT ${component})
+endfunction()
+install_finders(${library} library)
+install_finders(morvik_link link)

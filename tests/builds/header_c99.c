@@ -1,4 +1,5 @@
 /* The public headers alone, as strict C99. */
+#include "morvik_link.h"
 #include "morvik_v1_0_version.h"
 
 /* Fourteen words: three pointers and eleven integers, with the padding that the pointers ask for. */

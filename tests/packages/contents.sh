@@ -15,14 +15,14 @@ fail() {
 cd "$folder"
 
 version=$("$build/bin/morvik" --version | sed 's/^morvik //')-1
-library=libmorvik-v1-0-bitacc-cmodel1 development=libmorvik-v1-0-bitacc-cmodel-dev
+library=libmorvik-v1-0-bitacc-cmodel1 link=libmorvik-link1 development=libmorvik-v1-0-bitacc-cmodel-dev
 case $(file -L "$build/bin/morvik") in
     *32-bit*)
         architecture=i386
-        expected=("$library" "$development" morvik morvik-simulators) ;;
+        expected=("$library" "$link" "$development" morvik morvik-simulators) ;;
     *)
         architecture=amd64
-        expected=("$library" "$development" morvik morvik-mpi morvik-simulators python3-morvik octave-morvik morvik-doc) ;;
+        expected=("$library" "$link" "$development" morvik morvik-mpi morvik-simulators python3-morvik octave-morvik morvik-doc) ;;
 esac
 names=()
 for package in *.deb; do
@@ -41,9 +41,11 @@ depends() {
     [[ ", $(field "$1" Depends)," == *", $2"[\ ,]* ]] || fail "$1 does not depend on $2: $(field "$1" Depends)"
 }
 depends "$library" libstdc++6
+depends "$link" libstdc++6
 depends "$development" "$library"
+depends "$development" "$link"
 depends morvik "$library"
-[ "$(field "$library" Multi-Arch)" = same ] || fail "The libraries of two architectures exclude each other"
+[ "$(field "$library" Multi-Arch)$(field "$link" Multi-Arch)" = samesame ] || fail "The libraries of two architectures exclude each other"
 if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) == *lib*32* ]]; then
     fail "A package depends on 32-bit libraries in packages for 64-bit machines"
 fi
