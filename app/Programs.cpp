@@ -1,12 +1,13 @@
 // Programs: the arguments of `morvik` and `morvik-mpi`.
 #include "Programs.h"
 
-#include "Decode.h"
 #include "Doctor.h"
+#include "Encode.h"
 #include "Trace.h"
 #include "Vectors.h"
 #include "ber/Merge.h"
 #include "compare/Compare.h"
+#include "decode/Decode.h"
 #include "info/Info.h"
 #include "selftest/SelfTest.h"
 
@@ -26,6 +27,7 @@ Program morvikProgram()
     app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
     program.commands = {
         addDecode(app),
+        addEncode(app),
         addBer(app),
         addMerge(app),
         addVectors(app),

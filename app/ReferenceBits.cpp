@@ -3,22 +3,18 @@
 
 #include <string_view>
 
-#include "base/Shown.h"
+#include "BitLines.h"
 
 namespace morvik {
 
-ReferenceBits::ReferenceBits(std::istream& input, const std::string& name)
-    : itsLines(input, name, base::LineReader::shortLines)
+ReferenceBits::ReferenceBits(std::istream& input, const std::string& name, std::size_t longest)
+    : itsLines(input, name, longest)
 {
 }
 
 std::vector<std::uint8_t> ReferenceBits::next()
 {
-    std::vector<std::uint8_t> bits;
-    for (const char bit : nextLine()) {
-        bits.push_back(bit == '1' ? 1 : 0);
-    }
-    return bits;
+    return bitsOf(nextLine());
 }
 
 std::size_t ReferenceBits::countErrors(const std::vector<std::uint8_t>& decisions)
@@ -49,13 +45,8 @@ std::string_view ReferenceBits::nextLine()
         const std::size_t missing = itsLines.number() + 1;
         itsLines.failAt(missing, "no line for block " + std::to_string(missing) + ", expected one for each block");
     }
-    const std::string_view line = itsLines.text();
-    const std::size_t other = line.find_first_not_of("01");
-    if (other != std::string_view::npos) {
-        itsLines.fail("character " + base::shown(line.substr(other, 1)) + " in column " + std::to_string(other + 1) +
-                      ", allowed are 0 and 1");
-    }
-    return line;
+    expectBits(itsLines);
+    return itsLines.text();
 }
 
 void ReferenceBits::expectEnd()

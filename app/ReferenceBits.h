@@ -16,8 +16,8 @@ namespace morvik {
 /// Returns the lines in turn or compares decisions with them. Throws base::Error if a line is wrong.
 class ReferenceBits {
 public:
-    /// `input` must outlive the reader; messages call it `name`.
-    ReferenceBits(std::istream& input, const std::string& name);
+    /// `input` must outlive the reader; messages call it `name`. Lines have at most `longest` bits.
+    ReferenceBits(std::istream& input, const std::string& name, std::size_t longest = base::LineReader::shortLines);
 
     /// The bits of the next line, each 0 or 1.
     std::vector<std::uint8_t> next();

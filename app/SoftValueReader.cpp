@@ -13,14 +13,10 @@
 
 namespace morvik {
 
-namespace {
-
 bool isLabel(std::string_view text)
 {
     return !text.empty() && std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
 }
-
-}  // namespace
 
 SoftValueReader::SoftValueReader(std::istream& input, const std::string& name)
     : itsLines(input, name, base::LineReader::shortLines)
@@ -85,24 +81,13 @@ void SoftValueReader::advance()
 void SoftValueReader::readLabel()
 {
     if (base::trimmed(itsLines.text()).empty()) {
-        expectOnlyBlankLines();
+        itsLines.expectOnlyBlankLines();
         itsAtEnd = true;
         return;
     }
     itsLabel = itsRow.fields().front();
     if (!isLabel(itsLabel)) {
         itsLines.fail("block " + base::shown(itsLabel) + " is no label, allowed are non-negative integers");
-    }
-}
-
-void SoftValueReader::expectOnlyBlankLines()
-{
-    const std::size_t first = itsLines.number();
-    while (itsLines.next()) {
-        if (!base::trimmed(itsLines.text()).empty()) {
-            itsLines.failAt(first, "blank line, allowed at the end only");
-        }
-        itsLines.expectAnEnd(first);
     }
 }
 

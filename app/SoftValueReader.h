@@ -7,6 +7,7 @@
 #include <istream>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "base/Csv.h"
 #include "base/Error.h"
@@ -20,6 +21,9 @@ constexpr char softValueHeader[] = "block,rsc1_sys,rsc1_par,rsc2_par";
 
 /// The allowed numbers of rows in a block, for messages.
 constexpr char allowedRows[] = "K + 4 rows, K being one of the block sizes of 3GPP TS 36.212 (40 to 6144)";
+
+/// Whether the text is a block's label: a non-negative integer of any length.
+bool isLabel(std::string_view text);
 
 /// Reads one block at a time.
 ///
@@ -48,7 +52,6 @@ private:
     /// Reads the next row and its label; an error ends the rows and is kept.
     void advance();
     void readLabel();
-    void expectOnlyBlankLines();
     void appendRow(SoftBlock& block) const;
     std::int32_t value(std::size_t column) const;
 

@@ -64,6 +64,17 @@ void LineReader::expectAnEnd(std::size_t first) const
     }
 }
 
+void LineReader::expectOnlyBlankLines()
+{
+    const std::size_t first = itsNumber;
+    while (next()) {
+        if (!trimmed(itsText).empty()) {
+            failAt(first, "blank line, allowed at the end only");
+        }
+        expectAnEnd(first);
+    }
+}
+
 void LineReader::fail(const std::string& what) const
 {
     throw Error(place() + ": " + what);

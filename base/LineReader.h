@@ -52,6 +52,9 @@ public:
     /// Throws if the blank lines that begin at line `first` exceed mostBlank.
     void expectAnEnd(std::size_t first) const;
 
+    /// Reads on to the end, after a blank line. Throws about that line if another one is not blank.
+    void expectOnlyBlankLines();
+
     /// Throws an Error about this line.
     [[noreturn]] void fail(const std::string& what) const;
 

@@ -15,14 +15,20 @@ namespace {
 TransportFormat checked(const TransportFormat& format, const CodeBlocks& blocks)
 {
     const unsigned perSymbol = format.bitsPerSymbol * format.layers;
-    if (perSymbol == 0 || format.codedBits % perSymbol != 0) {
+    if (perSymbol == 0 || format.bitsPerSymbol > 8 || format.layers > 4) {
+        throw std::invalid_argument("symbols of " + std::to_string(format.bitsPerSymbol) + " bits on " +
+                                    std::to_string(format.layers) + " layers, allowed are 1 to 8 bits on 1 to 4");
+    }
+    if (format.codedBits % perSymbol != 0) {
+        const unsigned below = format.codedBits / perSymbol * perSymbol;
         throw std::invalid_argument(std::to_string(format.codedBits) + " coded bits are no multiple of the " +
-                                    std::to_string(perSymbol) + " bits of a symbol");
+                                    std::to_string(perSymbol) + " bits of a symbol, " + std::to_string(below) +
+                                    " and " + std::to_string(below + perSymbol) + " are");
     }
     if (format.codedBits / perSymbol < blocks.count) {
         throw std::invalid_argument(std::to_string(format.codedBits) + " coded bits are too few for " +
-                                    std::to_string(blocks.count) + " code blocks, which take at least " +
-                                    std::to_string(blocks.count * perSymbol));
+                                    std::to_string(blocks.count) + " code blocks, which take " +
+                                    std::to_string(blocks.count * perSymbol) + " or more");
     }
     return format;
 }

@@ -38,6 +38,7 @@ bool takes(CLI::App& command, const CLI::Option& option, const std::string& valu
     } catch (const CLI::ValidationError&) {
         return false;
     } catch (const CLI::RequiredError&) {
+    } catch (const CLI::RequiresError&) {
     }
     return true;
 }

@@ -298,7 +298,7 @@ TEST_F(Command, RefusesArgumentsThatItDoesNotKnow)
     expectUsageError({"decode", "--frobnicate"}, "morvik decode: ");
     expectUsageError({"decode", "one.csv", "two.csv"}, "morvik decode: ");
     expectUsageError({"decode", "--output"}, "morvik decode: --output");
-    expectUsageError({"encode"}, "morvik: ");
+    expectUsageError({"modulate"}, "morvik: ");
     expectUsageError({"--frobnicate"}, "morvik: ");
 }
 

@@ -1,10 +1,13 @@
-// csv_fuzz: the command's readers of soft values and reference bits take any text.
+// csv_fuzz: the command's readers of soft values, of coded bits and of bits take any text.
+#include <cmath>
 #include <sstream>
 
+#include "BitLines.h"
 #include "FuzzInput.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
 #include "base/Error.h"
+#include "decode/CodedValueReader.h"
 
 namespace {
 
@@ -38,6 +41,36 @@ void readBits(const std::string& text)
     }
 }
 
+void readCodedValues(const std::string& text, unsigned codedBits)
+{
+    std::istringstream stream(text);
+    try {
+        morvik::CodedValueReader reader(stream, "in", codedBits);
+        while (reader.next()) {
+            require(reader.values().size() == codedBits, "a row has a value for each coded bit");
+            for (const float value : reader.values()) {
+                require(std::isfinite(value), "values are finite");
+            }
+        }
+    } catch (const morvik::base::Error& error) {
+        requireOneLine(error, "in:");
+    }
+}
+
+void readBitLines(const std::string& text)
+{
+    std::istringstream stream(text);
+    try {
+        morvik::BitLines lines(stream, "in");
+        while (lines.next()) {
+            require(morvik::lineOf(morvik::bitsOf(lines.text())) == std::string(lines.text()) + '\n',
+                    "a line of bits is what it was read from");
+        }
+    } catch (const morvik::base::Error& error) {
+        requireOneLine(error, "in:");
+    }
+}
+
 }  // namespace
 
 int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
@@ -47,5 +80,8 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
     const std::string text = input.text();
     readBlocks(header ? std::string(morvik::softValueHeader) + "\n" + text : text);
     readBits(text);
+    readBitLines(text);
+    const auto codedBits = static_cast<unsigned>(1 + text.size() % 3);
+    readCodedValues(header ? std::string(morvik::codedValueHeader) + "\n" + text : text, codedBits);
     return 0;
 }

@@ -1,6 +1,6 @@
 // Decode: the subcommand that turns a file of soft values into decisions.
-#ifndef MORVIK_APP_DECODE_H
-#define MORVIK_APP_DECODE_H
+#ifndef MORVIK_APP_DECODE_DECODE_H
+#define MORVIK_APP_DECODE_DECODE_H
 
 #include "Command.h"
 

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <cmath>
 #include <cstdint>
 #include <iostream>
 #include <memory>
@@ -11,11 +12,14 @@
 #include <vector>
 
 #include "Arguments.h"
+#include "BitLines.h"
 #include "DecoderOptions.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "TransportDecode.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
+#include "base/Numbers.h"
 #include "base/Text.h"
 #include "hardware/testbench/Decoder.h"
 
@@ -30,6 +34,7 @@ struct Options {
     DecoderOptions decoder;
     std::uint32_t firstTag = 0;
     std::uint32_t tracedPasses = 0;
+    TransportDecodeOptions transport;  ///< bits is 0 for code blocks; files and decoder are those above
 };
 
 /// The figures of the closing line.
@@ -105,17 +110,6 @@ void decodeBlock(Decoder& decoder,
     }
 }
 
-/// A block's decisions as a line of output.
-std::string decisionLine(const std::vector<std::uint8_t>& bits)
-{
-    std::string line;
-    line.reserve(bits.size() + 1);
-    for (const std::uint8_t bit : bits) {
-        line += bit != 0 ? '1' : '0';
-    }
-    return line + '\n';
-}
-
 /// Runs an action that may find an error in an input. Keeps the decisions made before the error.
 template <class Action>
 auto keeping(base::OutputFile& output, Action action)
@@ -145,7 +139,7 @@ void decodeBlocks(const Options& options,
         });
         summary.decoding += std::chrono::steady_clock::now() - start;
         summary.countBlock(bits.size());
-        output.write(decisionLine(bits));
+        output.write(lineOf(bits));
         output.flush();
         keeping(output, [&] {
             if (!messages) {
@@ -184,6 +178,25 @@ int decode(const Options& options)
     return summary.bitErrors > 0 ? differencesFound : success;
 }
 
+float readScale(const std::string& text)
+{
+    const auto scale = base::parseNumber<float>(text);
+    if (!scale || !std::isfinite(*scale) || *scale <= 0) {
+        refuse("--scale", text, "allowed are numbers above 0");
+    }
+    return *scale;
+}
+
+TransportDecodeOptions transportOptions(const Options& options)
+{
+    TransportDecodeOptions transport = options.transport;
+    transport.input = options.input;
+    transport.output = options.output;
+    transport.reference = options.reference;
+    transport.decoder = options.decoder;
+    return transport;
+}
+
 /// The end of the help text.
 std::string explanation()
 {
@@ -192,11 +205,54 @@ and has one row for each of the K + 4 positions of a block. A new number in the 
 column starts a new block. Each block gives one line of 0 and 1. Soft values are clipped to
 -128 ... 127, after the core has cut them to their low 24 bits.
 
+With --transport-block-size, FILE opens with the line
+block,soft_values
+and has one row for each transmission of a transport block: its number, then a value for each
+of the G coded bits; the second row of the same number has the second redundancy version.
+Transmissions are added up until the CRC fits.
+
 Warnings and traces go to the standard error stream, or to standard output when --output
-names a file. Exit status: 0 all decoded, 1 the reference differs, 2 bad input or usage.
+names a file. Exit status: 0 all decoded, 1 the reference differs or a CRC fails, 2 bad input
+or usage.
 
 Example: decode with eight units, compare with what was sent, and keep the decisions
   morvik decode k40.csv --num-pu 8 --reference k40.bits --output decided.bits)";
+}
+
+/// Adds the options for transport blocks, which --tag and --trace have nothing to do with.
+void addTransportDecodeOptions(CLI::App& command, TransportDecodeOptions& options)
+{
+    CLI::Option* const size =
+        command
+            .add_option(
+                "--transport-block-size", options.bits, "FILE has transmissions of transport blocks of A bits, below")
+            ->transform(integerFrom(1, link::mostTransportBits))
+            ->type_name("A");
+    command.add_flag("--transport-block", "Says the same, as for 'morvik encode'")->needs(size);
+    for (const char* const other : {"--tag", "--tag-width", "--trace"}) {
+        size->excludes(command.get_option(other));
+    }
+    addTransportOptions(command, *size, options.transport);
+    command
+        .add_option_function<std::string>(
+            "--scale",
+            [&options](const std::string& text) { options.scale = readScale(text); },
+            "Steps of the core for a value of 1: 1 for soft values, more for log-likelihood ratios")
+        ->type_name("S")
+        ->default_str("1")
+        ->needs(size);
+    command
+        .add_option("--soft-buffer-bits",
+                    options.softBufferBits,
+                    "Width of the soft buffer, whose sums saturate, 2 to 16; without it, sums have full width")
+        ->transform(integerFrom(2, 16))
+        ->type_name("W")
+        ->needs(size);
+    command
+        .add_option(
+            "--crc", options.crcFile, "Write the CRC results of transport blocks and code blocks to FILE, as CSV")
+        ->type_name("FILE")
+        ->needs(size);
 }
 
 }  // namespace
@@ -223,10 +279,11 @@ Command addDecode(CLI::App& app)
         ->transform(integerFrom(0, UINT32_MAX))
         ->type_name("N")
         ->capture_default_str();
+    addTransportDecodeOptions(*command, options->transport);
     command->footer(explanation());
 
     const auto run = [options] {
-        return decode(*options);
+        return options->transport.bits > 0 ? decodeTransportBlocks(transportOptions(*options)) : decode(*options);
     };
     return {command, run};
 }
