@@ -70,9 +70,9 @@ struct Variant {
 };
 
 constexpr Variant variants[] = {
-    {Base::MOD, Base::MOD_HASH, morvik::plain::Decision::Max},
-    {Base::MOD_STAR, Base::MOD, morvik::plain::Decision::MaxStar},
-    {Base::MOD_HASH, Base::MOD_STAR, morvik::plain::Decision::MaxHash},
+    {Base::MOD, Base::MOD_HASH, morvik::plain::Decision::max},
+    {Base::MOD_STAR, Base::MOD, morvik::plain::Decision::maxStar},
+    {Base::MOD_HASH, Base::MOD_STAR, morvik::plain::Decision::maxHash},
 };
 
 /// Values anywhere, at the extremes, around the wrap point, or close to each other.

@@ -428,7 +428,7 @@ TEST(TDecoder3G, RunsPassesOverTheWholeTrellisInterleavedOrderFirst)
     const morvik::plain::Column stateZero = {0, -16384, -16384, -16384, -16384, -16384, -16384, -16384};
     const std::vector<int> table = morvik::plain::correctionTable(16);
     const std::vector<unsigned> interleaved = morvik::plain::permutation(K);
-    constexpr auto rule = morvik::plain::Decision::MaxHash;
+    constexpr auto rule = morvik::plain::Decision::maxHash;
     morvik::blocks::Random random(3);
     for (const bool layout3GPP2 : layouts) {
         Soft soft(layout3GPP2 ? 5 * K + 18 : 3 * K + 12);

@@ -106,7 +106,7 @@ public:
           itsK(cut.segments * cut.length),
           itsPermutation(permutation(itsK)),
           itsScaled(algorithm == 1),
-          itsRule(algorithm == 2 ? Decision::MaxHash : Decision::Max),
+          itsRule(algorithm == 2 ? Decision::maxHash : Decision::max),
           itsTable(algorithm == 2 ? correctionTable(16) : std::vector<int>())
     {
     }

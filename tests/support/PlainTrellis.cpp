@@ -32,12 +32,12 @@ public:
     {
         const int difference = wrap16(first.value - second.value);
         const Metric& winner = difference < 0 ? second : first;
-        if (itsRule == Decision::Max) {
+        if (itsRule == Decision::max) {
             return winner;
         }
         const int index = difference + 32768;
         const int correction = itsTable.at(static_cast<std::size_t>(index));
-        if (itsRule == Decision::MaxStar) {
+        if (itsRule == Decision::maxStar) {
             return {wrap16(winner.value + correction), 0};
         }
         return {wrap16(winner.value + winner.pending), correction};
@@ -67,7 +67,7 @@ int branchMetric(const Transition& edge, const BranchColumn& g)
     return -g[branchNumber(1 - edge.parity0, 1 - edge.parity1)];
 }
 
-enum class Direction { Forward, Backward };
+enum class Direction { forward, backward };
 
 // One step of a recursion: every state decides between its edge for a bit of 1 and that for a bit of 0.
 MetricColumn advance(const MetricColumn& old, const BranchColumn& g, Direction direction, const Decider& decide)
@@ -76,8 +76,8 @@ MetricColumn advance(const MetricColumn& old, const BranchColumn& g, Direction d
     for (std::size_t state = 0; state < stateCount; ++state) {
         for (unsigned bit = 0; bit < 2; ++bit) {
             const Transition edge = transition(state, bit);
-            const std::size_t source = direction == Direction::Forward ? edge.from : edge.to;
-            const std::size_t target = direction == Direction::Forward ? edge.to : edge.from;
+            const std::size_t source = direction == Direction::forward ? edge.from : edge.to;
+            const std::size_t target = direction == Direction::forward ? edge.to : edge.from;
             candidates[bit][target] = {wrap16(old.value[source] + branchMetric(edge, g)), old.pending[source]};
         }
     }
@@ -174,7 +174,7 @@ std::vector<Column> forward(const std::vector<BranchColumn>& g,
     std::vector<Column> columns = {start};
     MetricColumn metrics = {start, {}};
     for (std::size_t j = 0; j + 1 < g.size(); ++j) {
-        metrics = advance(metrics, g[j], Direction::Forward, Decider(rule, table));
+        metrics = advance(metrics, g[j], Direction::forward, Decider(rule, table));
         columns.push_back(metrics.value);
     }
     return columns;
@@ -188,7 +188,7 @@ std::vector<Column> backward(const std::vector<BranchColumn>& g,
     std::vector<Column> columns = {start};
     MetricColumn metrics = {start, {}};
     for (std::size_t j = g.size() - 1; j > 0; --j) {
-        metrics = advance(metrics, g[j], Direction::Backward, Decider(rule, table));
+        metrics = advance(metrics, g[j], Direction::backward, Decider(rule, table));
         columns.push_back(metrics.value);
     }
     std::reverse(columns.begin(), columns.end());

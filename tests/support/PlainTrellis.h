@@ -15,9 +15,9 @@ using BranchColumn = std::array<int, 4>;  // the metrics of the four parity patt
 
 // The result of a decision between two metrics.
 enum class Decision {
-    Max,      // MOD: the greater one
-    MaxStar,  // MOD*: the greater one, plus the correction of this decision
-    MaxHash,  // MOD#: the greater one, plus the correction of the decision from which that one came
+    max,      // MOD: the greater one
+    maxStar,  // MOD*: the greater one, plus the correction of this decision
+    maxHash,  // MOD#: the greater one, plus the correction of the decision from which that one came
 };
 
 // One edge of the trellis.
