@@ -54,29 +54,52 @@ void selectPasses(const Options& options, trace::Selection& selection)
     selection.last = *last;
 }
 
-/// Appends the signal of this name, or all whose name is this one and a number.
+/// The names that stand for all signals of a kind.
+std::vector<std::string> kindNames()
+{
+    std::vector<std::string> names;
+    for (const Stage stage : stages) {
+        if (signalsOf(stage).count > 1) {
+            names.push_back(nameOf(stage));
+        }
+    }
+    return names;
+}
+
+/// What --signals takes; `separator` stands before the names of kinds.
+std::string knownSignals(const char* separator)
+{
+    std::string text = signalNames();
+    for (const std::string& each : kindNames()) {
+        text += separator + each;
+        separator = ", ";
+    }
+    return text + " for all of a kind";
+}
+
+/// Appends the signal of this name, or all of a kind.
 void appendSignals(const std::string& text, std::vector<unsigned>& signals)
 {
     const std::size_t before = signals.size();
     for (unsigned i = 0; i < passSignals.size(); ++i) {
-        const std::string name = passSignals[i];
-        if (name == text || name.substr(0, name.find_last_not_of("0123456789") + 1) == text) {
+        if (text == passSignals[i].name || text == nameOf(stageOf(i))) {
             signals.push_back(i);
         }
     }
     if (signals.size() == before) {
-        refuse(
-            "--signals",
-            text,
-            "known are intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to beta7 (beta), llr, extrinsic");
+        refuse("--signals", text, "known are " + knownSignals(", and "));
     }
 }
 
 /// The names that appendSignals() accepts.
 std::vector<std::string> signalWords()
 {
-    std::vector<std::string> words(passSignals.begin(), passSignals.end());
-    words.insert(words.end(), {"g", "alpha", "beta"});
+    std::vector<std::string> words;
+    for (const Signal& signal : passSignals) {
+        words.emplace_back(signal.name);
+    }
+    const std::vector<std::string> kinds = kindNames();
+    words.insert(words.end(), kinds.begin(), kinds.end());
     return words;
 }
 
@@ -136,9 +159,7 @@ void write(Options options)
         return;
     }
     if (selection.signals.empty()) {
-        for (const char* const kind : {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"}) {
-            appendSignals(kind, selection.signals);
-        }
+        selection.signals = allSignals();
     }
     Passes passes(block, options.decoder.generics, std::cerr);
     checkUnits(options, passes.cut());
@@ -159,14 +180,17 @@ int run(const Options& options)
     return success;
 }
 
-constexpr char explanation[] =
+constexpr char explanationBeforeSignals[] =
     R"(FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
 interleaved constituent code. 'text' is the library's own trace; it lacks the branch metrics,
 which the other formats have. 'vcd' has a scope for each unit and thread; a unit of its time is
 a trellis step. docs/trace.md tells the rest.
 
-Signals: intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to beta7 (beta), llr,
-extrinsic. Exit status: 0 written, 2 bad input or usage.
+Signals: )";
+
+constexpr char explanationAfterSignals[] =
+    R"(.
+Exit status: 0 written, 2 bad input or usage.
 
 Example: waveforms of the first iteration
   morvik trace k1024.csv --half-iterations 0:1 --format vcd --output k1024.vcd)";
@@ -205,7 +229,7 @@ Command addTrace(CLI::App& app)
         ->capture_default_str();
     addSelectionOptions(*command, *options);
     addDecoderOptions(*command, options->decoder);
-    command->footer(explanation);
+    command->footer(explanationBeforeSignals + knownSignals(",\nand ") + explanationAfterSignals);
     const auto work = [options] {
         return run(*options);
     };

@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace morvik::base {
 
@@ -36,6 +37,25 @@ inline std::string plural(const std::string& noun, std::uint64_t count)
 inline std::string counted(std::uint64_t count, const std::string& noun)
 {
     return std::to_string(count) + ' ' + plural(noun, count);
+}
+
+/// Lists ascending numbers by their names, neighbours as a range: "2 to 15", "alpha0 to alpha7, llr".
+/// `continuesRange` tells whether a number may be in a range with the one before it.
+template <class Name, class ContinuesRange>
+std::string listed(const std::vector<unsigned>& numbers, Name name, ContinuesRange continuesRange)
+{
+    std::string text;
+    for (std::size_t first = 0, last = 0; first < numbers.size(); first = ++last) {
+        while (last + 1 < numbers.size() && numbers[last + 1] == numbers[last] + 1 &&
+               continuesRange(numbers[last + 1])) {
+            ++last;
+        }
+        text += (text.empty() ? "" : ", ") + name(numbers[first]);
+        if (last > first) {
+            text += (last > first + 1 ? " to " : ", ") + name(numbers[last]);
+        }
+    }
+    return text;
 }
 
 }  // namespace morvik::base

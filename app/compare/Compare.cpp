@@ -83,10 +83,13 @@ int compare(const Options& options)
     return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
 }
 
-constexpr char explanation[] =
+constexpr char explanationBeforeSignals[] =
     R"(A dump has the values of a simulation of hardware: CSV with the columns half_iteration, step,
 signal and value, or a VCD in whose scopes half_iteration and step say what the others belong
-to. Signals are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr and extrinsic.
+to. Signals: )";
+
+constexpr char explanationAfterSignals[] =
+    R"(.
 It may lack signals, but not values of those that it has, unless --partial is given; a value
 that is x differs, unless --ignore-x is given. MAP is a JSON object that tells other names
 and forms of numbers; docs/compare.md has examples.
@@ -121,7 +124,7 @@ Command addCompare(CLI::App& app)
     command->add_flag("--ignore-x", options->ignoreUnknown, "Leave out unknown values, and count them");
     command->add_flag("--partial", options->partial, "Accept a dump that lacks values of its signals, and count them");
     addDecoderOptions(*command, options->decoder);
-    command->footer(explanation);
+    command->footer(explanationBeforeSignals + signalNames() + explanationAfterSignals);
 
     const auto run = [options] {
         return compare(*options);

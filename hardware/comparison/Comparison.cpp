@@ -200,9 +200,10 @@ std::vector<InputState> inputsOf(const Model& model, const Place& place)
         return {inputAt(Stage::forward, place.pass, place.step),
                 inputAt(Stage::backward, place.pass, place.step),
                 inputAt(Stage::branch, place.pass, place.step)};
-    default:
-        return {inputAt(Stage::ratio, place.pass, place.step), inputAt(Stage::intrinsic, place.pass, place.step)};
+    case Stage::extrinsic:
+        break;
     }
+    return {inputAt(Stage::ratio, place.pass, place.step), inputAt(Stage::intrinsic, place.pass, place.step)};
 }
 
 std::uint64_t Comparison::compared() const

@@ -2,6 +2,7 @@
 #include "Coverage.h"
 
 #include <algorithm>
+
 #include "base/Text.h"
 
 namespace morvik::comparison {
@@ -54,34 +55,6 @@ std::uint64_t countOf(const Values& values)
     return count;
 }
 
-/// Lists numbers as "2 to 15", "alpha0 to alpha7, llr". `inRow` tells whether a number continues the range.
-template <class Name, class InRow>
-std::string listed(const std::vector<unsigned>& numbers, Name name, InRow inRow)
-{
-    std::string text;
-    for (std::size_t first = 0, last = 0; first < numbers.size(); first = ++last) {
-        while (last + 1 < numbers.size() && numbers[last + 1] == numbers[last] + 1 && inRow(numbers[last + 1])) {
-            ++last;
-        }
-        text += (text.empty() ? "" : ", ") + name(numbers[first]);
-        if (last > first) {
-            text += (last > first + 1 ? " to " : ", ") + name(numbers[last]);
-        }
-    }
-    return text;
-}
-
-std::string signalNames(const std::vector<unsigned>& signals)
-{
-    const auto name = [](unsigned signal) {
-        return std::string(passSignals[signal]);
-    };
-    const auto inRow = [](unsigned signal) {
-        return signalsOf(stageOf(signal)).first != signal;
-    };
-    return listed(signals, name, inRow);
-}
-
 }  // namespace
 
 Coverage coverageOf(const Model& model, const Dump& dump)
@@ -121,12 +94,12 @@ std::vector<std::string> lacksOf(const Coverage& coverage)
             return std::to_string(pass);
         };
         lacks.push_back(base::plural("half-iteration", coverage.absentPasses.size()) + ' ' +
-                        listed(coverage.absentPasses, number, [](unsigned) { return true; }));
+                        base::listed(coverage.absentPasses, number, [](unsigned) { return true; }));
     }
     if (coverage.firstGap) {
         const Place& first = *coverage.firstGap;
         lacks.push_back(base::counted(coverage.gaps, "value") + " of " + signalNames(coverage.gapSignals) +
-                        "; the first is " + passSignals[first.signal] + " of half-iteration " +
+                        "; the first is " + passSignals[first.signal].name + " of half-iteration " +
                         std::to_string(first.pass) + ", step " + std::to_string(first.step));
     }
     if (!coverage.absentSignals.empty()) {
@@ -134,8 +107,8 @@ std::vector<std::string> lacksOf(const Coverage& coverage)
                         signalNames(coverage.absentSignals));
     }
     for (const unsigned signal : coverage.copiedSignals) {
-        lacks.push_back(std::string("signal ") + passSignals[signal] + ", which is always " +
-                        passSignals[twinOf(signal)]);
+        lacks.push_back(std::string("signal ") + passSignals[signal].name + ", which is always " +
+                        passSignals[twinOf(signal)].name);
     }
     return lacks;
 }

@@ -93,8 +93,8 @@ private:
     {
         for (const SignalColumn& each : itsColumns) {
             if (each.signal == signal) {
-                itsFile.fail("two columns are " + std::string(passSignals[signal]) + ", " + shown(each.name) + " and " +
-                             shown(name));
+                itsFile.fail("two columns are " + std::string(passSignals[signal].name) + ", " + shown(each.name) +
+                             " and " + shown(name));
             }
         }
         itsColumns.push_back({name, signal, column});

@@ -21,7 +21,7 @@ void DumpFile::expectNoneLacking(const std::set<std::string, std::less<>>& names
     if (!names.empty()) {
         const std::string& first = *names.begin();
         failAsAWhole("has no signal " + base::shown(first) + ", which the map calls " +
-                     passSignals[*map.signal(first)]);
+                     passSignals[*map.signal(first)].name);
     }
 }
 
@@ -65,7 +65,7 @@ void completeTwins(const std::string& name, const NameMap& map, Dump& dump)
     for (unsigned signal = 0; signal < signalCount; ++signal) {
         const unsigned twin = twinOf(signal);
         if (dump.given[signal] && dump.given[twin] && !map.standIns[signal].empty()) {
-            throw base::Error(name + ": has " + passSignals[signal] + ", for which " +
+            throw base::Error(name + ": has " + passSignals[signal].name + ", for which " +
                               base::shown(map.standIns[signal]) + " stands in the map");
         }
         if (!dump.given[signal] && dump.given[twin]) {

@@ -80,8 +80,7 @@ std::vector<unsigned> stepsInOrder(const rules::Cut& cut, Stage stage)
             steps.push_back(u * cut.segmentLength() + time);
         }
     }
-    const unsigned behind = stage == Stage::intrinsic ? rules::tailSteps : stage == Stage::forward ? 1 : 0;
-    for (unsigned step = 0; step < behind; ++step) {
+    for (unsigned step = 0; step < stepsAfterBits(stage); ++step) {
         steps.push_back(cut.K() + step);
     }
     return steps;

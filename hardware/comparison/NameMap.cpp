@@ -28,8 +28,6 @@ constexpr std::array<std::pair<const char*, NumberForm>, 6> numberForms = {{{"au
                                                                             {"hex", NumberForm::hexadecimal},
                                                                             {"binary", NumberForm::binary}}};
 
-constexpr char signalNames[] = "intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic";
-
 /// A real number that is a multiple of an eighth.
 std::optional<std::int64_t> eighths(std::string_view text)
 {
@@ -125,7 +123,7 @@ private:
     static std::optional<unsigned> signalOf(const Json& name)
     {
         const auto* const found =
-            std::find_if(passSignals.begin(), passSignals.end(), [&](const char* each) { return name == each; });
+            std::find_if(passSignals.begin(), passSignals.end(), [&](const Signal& each) { return name == each.name; });
         return found == passSignals.end() ? std::nullopt
                                           : std::optional<unsigned>(static_cast<unsigned>(found - passSignals.begin()));
     }
@@ -141,7 +139,7 @@ private:
         for (const auto& [name, bits] : value.items()) {
             const auto signal = signalOf(name);
             if (!signal) {
-                fail("bits of " + shown(name) + std::string(", allowed are ") + signalNames);
+                fail("bits of " + shown(name) + ", allowed are " + signalNames());
             }
             map.bits[*signal] = count(name, bits, fewest, most);
         }
@@ -159,7 +157,7 @@ private:
             }
             const auto signal = signalOf(ours);
             if (!signal && !ours.is_null()) {
-                fail("signal " + shown(theirs) + " is " + shownValue(ours) + ", allowed are " + signalNames +
+                fail("signal " + shown(theirs) + " is " + shownValue(ours) + ", allowed are " + signalNames() +
                      ", and null");
             }
             map.signals[theirs] = signal.value_or(NameMap::leftOut);
@@ -209,10 +207,9 @@ private:
 
 NameMap::NameMap() : bits()
 {
-    constexpr unsigned metricBits = 12;
-    bits.fill(metricBits);
+    bits.fill(passBits);
     for (unsigned i = 0; i < signalCount; ++i) {
-        signals[passSignals[i]] = i;
+        signals[passSignals[i].name] = i;
     }
 }
 

@@ -161,9 +161,10 @@ Column Replay::column(unsigned pass, Stage stage, unsigned trellisStep, Mistake 
         return backwardColumn(pass, trellisStep, mistake);
     case Stage::ratio:
         return ratioColumn(pass, trellisStep, mistake);
-    default:
-        return extrinsicColumn(pass, trellisStep, mistake);
+    case Stage::extrinsic:
+        break;
     }
+    return extrinsicColumn(pass, trellisStep, mistake);
 }
 
 std::int16_t Replay::input(const Place& place, bool& complete) const

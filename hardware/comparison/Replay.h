@@ -38,7 +38,7 @@ struct Mistake {
         ratioHeld,          ///< only the last difference of the ratio saturates
         storedIn,           ///< metrics and ratios cut to `number` bits once decided
         computedIn,         ///< in registers and adders of `number` bits
-        borderMask,         ///< border columns ANDed with `number`, in steps
+        borderMask,         ///< border columns ANDed with `number`, in eighths
         borderUnknown,      ///< border columns of zeros
         borderOfThisPass,   ///< instead of the last pass's
         borderOfLastPass,   ///< instead of this pass's
@@ -67,7 +67,7 @@ struct Mistake {
     int number;
 };
 
-/// The result of an operation, in steps of the state metrics' format.
+/// The result of an operation, in eighths.
 struct Column {
     std::array<std::int16_t, 8> values = {};  ///< of the stage's signals
     bool complete = true;                     ///< whether all inputs are in the dump
@@ -101,7 +101,7 @@ private:
 
     struct TwiceIntrinsic {
         int value;
-        bool isSure;  ///< whether the bit below a step, which dumps lack, follows from the dump's own values
+        bool isSure;  ///< whether the bit below an eighth, which dumps lack, follows from the dump's own values
     };
 
     TwiceIntrinsic twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const;

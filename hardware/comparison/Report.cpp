@@ -56,15 +56,10 @@ StageWords wordsOf(Stage stage)
         return {"backward metrics", "the backward recursion (rules 6 and 7)"};
     case Stage::ratio:
         return {"log-likelihood ratios", "the log-likelihood ratio (rule 8)"};
-    default:
-        return {"extrinsic values", "the extrinsic value: ratio - 4 x intrinsic value, scaled and clipped (rule 14)"};
+    case Stage::extrinsic:
+        break;
     }
-}
-
-std::string shortName(Stage stage)
-{
-    constexpr std::array<const char*, 6> names = {"intrinsic", "g", "alpha", "beta", "llr", "extrinsic"};
-    return names[static_cast<std::size_t>(stage)];
+    return {"extrinsic values", "the extrinsic value: ratio - 4 x intrinsic value, scaled and clipped (rule 14)"};
 }
 
 /// The only text, or "either A, or B".
@@ -171,7 +166,7 @@ private:
         itsText +=
             format("  window          %u of %u, steps %u to %u\n", where.row, cut.rows(), window.first, window.last);
         itsText += format("  trellis step    %u, %s\n", place.step, bitText(place).c_str());
-        itsText += format("  signal          %s\n", passSignals[place.signal]);
+        itsText += format("  signal          %s\n", passSignals[place.signal].name);
         addSource(place);
         itsText += '\n';
     }
@@ -240,7 +235,7 @@ private:
             const unsigned all = signalsOf(input.stage).count;
             const std::string part = input.present > 0 && input.present < all ? ", as far as it is in the dump" : "";
             itsText += format("  input %-10s of half-iteration %u, step %u: %s%s\n",
-                              shortName(input.stage).c_str(),
+                              nameOf(input.stage).c_str(),
                               input.pass,
                               input.step,
                               state,
@@ -303,7 +298,7 @@ private:
                 continue;
             }
             itsText += format("%-10s%10llu%9llu%9llu%13llu%9llu",
-                              passSignals[i],
+                              passSignals[i].name,
                               static_cast<unsigned long long>(count.compared),
                               static_cast<unsigned long long>(count.missing),
                               static_cast<unsigned long long>(count.unknown),

@@ -7,40 +7,9 @@
 #include <cstdint>
 #include <vector>
 
-#include "hardware/testbench/Passes.h"
+#include "hardware/testbench/Signals.h"
 
 namespace morvik::comparison {
-
-/// The operations of a pass, in their order.
-enum class Stage : std::uint8_t { intrinsic, branch, forward, backward, ratio, extrinsic };
-
-constexpr std::array<Stage, 6> stages = {
-    Stage::intrinsic, Stage::branch, Stage::forward, Stage::backward, Stage::ratio, Stage::extrinsic};
-
-constexpr unsigned signalCount = passSignals.size();
-
-/// The signals of a stage in passSignals.
-struct SignalRange {
-    unsigned first;
-    unsigned count;
-};
-
-constexpr SignalRange signalsOf(Stage stage)
-{
-    constexpr std::array<SignalRange, 6> ranges = {{{0, 1}, {1, 4}, {5, 8}, {13, 8}, {21, 1}, {22, 1}}};
-    return ranges[static_cast<std::size_t>(stage)];
-}
-
-constexpr Stage stageOf(unsigned signal)
-{
-    Stage found = Stage::intrinsic;
-    for (const Stage stage : stages) {
-        if (signalsOf(stage).first <= signal) {
-            found = stage;
-        }
-    }
-    return found;
-}
 
 /// The branch metric that always equals this one, as the code has one parity bit for each data bit (rule 5): g3 is g0,
 /// and g2 is g1. Other signals are returned unchanged.
@@ -57,7 +26,7 @@ struct Place {
     unsigned step;
 };
 
-/// Values in steps of the state metrics' format: 12 bits, eighths of 1.
+/// Values of the state metrics' format: 12 bits, in eighths.
 class Values {
 public:
     static constexpr std::int16_t smallest = rules::smallestOf(passBits);

@@ -394,7 +394,7 @@ private:
     [[noreturn]] void failAboutOwner(const VcdVariable& one, const VcdVariable& other, const Place& place) const
     {
         itsFile.fail(itsScopes.pathOf(one) + " and " + itsScopes.pathOf(other) + " both have " +
-                     passSignals[place.signal] + " of half-iteration " + std::to_string(place.pass) + ", step " +
+                     passSignals[place.signal].name + " of half-iteration " + std::to_string(place.pass) + ", step " +
                      std::to_string(place.step) + "; a map chooses one, or tells by \"valid\" when they count");
     }
 

@@ -173,8 +173,8 @@ void VcdScopes::preferPaths(unsigned signal, std::vector<unsigned>& candidates)
     if (others == candidates.begin() || others == candidates.end()) {
         return;
     }
-    itsNotes.push_back(std::string(passSignals[signal]) + " is " + pathOf(itsVariables[candidates.front()]) + ", not " +
-                       pathOf(itsVariables[*others]));
+    itsNotes.push_back(std::string(passSignals[signal].name) + " is " + pathOf(itsVariables[candidates.front()]) +
+                       ", not " + pathOf(itsVariables[*others]));
     candidates.erase(others, candidates.end());
 }
 
@@ -260,7 +260,7 @@ std::string VcdScopes::pathOf(const VcdVariable& variable) const
 
 void failAboutTwo(const VcdScopes& scopes, const VcdVariable& one, const VcdVariable& other)
 {
-    const std::string signal = passSignals[other.signal];
+    const std::string signal = passSignals[other.signal].name;
     throw base::Error("two variables are " + signal + ", " + scopes.pathOf(one) + " and " + scopes.pathOf(other) +
                       "; a map chooses: {\"signals\": {\"" + scopes.pathOf(other) + "\": \"" + signal + "\"}}");
 }

@@ -189,7 +189,7 @@ std::string Where::signalText() const
     std::size_t left = itsSignals.count();
     for (unsigned signal = 0; signal < signalCount; ++signal) {
         if (itsSignals.test(signal)) {
-            text += (text.empty() ? "in " : left == 1 ? " and " : ", ") + std::string(passSignals[signal]);
+            text += (text.empty() ? "in " : left == 1 ? " and " : ", ") + std::string(passSignals[signal].name);
             --left;
         }
     }

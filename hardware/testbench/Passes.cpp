@@ -9,24 +9,25 @@ namespace morvik {
 
 namespace {
 
-/// The first signal of each kind in passSignals.
-enum FirstSignal : unsigned { intrinsic = 0, branch = 1, forward = 5, backward = 13, ratio = 21, extrinsic = 22 };
-
 short alignedValue(const TDecoder& decoder, unsigned signal, std::uint32_t step)
 {
-    if (signal == extrinsic) {
-        return decoder.itsExtrinsic[step];
-    }
-    if (signal == ratio) {
+    const Stage stage = stageOf(signal);
+    const unsigned number = signal - signalsOf(stage).first;
+    switch (stage) {
+    case Stage::intrinsic:
+        return decoder.itsIntrinsic[step];
+    case Stage::branch:
+        return decoder.itsGamma[step][number];
+    case Stage::forward:
+        return decoder.itsAlpha[step][number];
+    case Stage::backward:
+        return decoder.itsBeta[step][number];
+    case Stage::ratio:
         return decoder.itsLLR[step];
+    case Stage::extrinsic:
+        break;
     }
-    if (signal >= backward) {
-        return decoder.itsBeta[step][signal - backward];
-    }
-    if (signal >= forward) {
-        return decoder.itsAlpha[step][signal - forward];
-    }
-    return signal >= branch ? decoder.itsGamma[step][signal - branch] : decoder.itsIntrinsic[step];
+    return decoder.itsExtrinsic[step];
 }
 
 }  // namespace
@@ -67,8 +68,7 @@ std::int16_t Passes::value(unsigned signal, std::uint32_t step) const
 
 bool Passes::isComputed(unsigned signal, std::uint32_t step) const
 {
-    const std::uint32_t K = itsCut.K();
-    return step < K || signal == intrinsic || (step == K && signal >= forward && signal < backward);
+    return step < itsCut.K() + stepsAfterBits(stageOf(signal));
 }
 
 }  // namespace morvik

@@ -2,27 +2,17 @@
 #ifndef MORVIK_HARDWARE_TESTBENCH_PASSES_H
 #define MORVIK_HARDWARE_TESTBENCH_PASSES_H
 
-#include <array>
 #include <cstdint>
 #include <ostream>
 
 #include "Decoder.h"
+#include "Signals.h"
 #include "rules/Cut.h"
-#include "rules/Formats.h"
 #include "rules/Schedule.h"
 
 class TDecoder3GPU;
 
 namespace morvik {
-
-/// The signals of a trellis step, in the order in which a pass computes them.
-constexpr std::array<const char*, 23> passSignals = {"intrinsic", "g0",     "g1",     "g2",     "g3",       "alpha0",
-                                                     "alpha1",    "alpha2", "alpha3", "alpha4", "alpha5",   "alpha6",
-                                                     "alpha7",    "beta0",  "beta1",  "beta2",  "beta3",    "beta4",
-                                                     "beta5",     "beta6",  "beta7",  "llr",    "extrinsic"};
-
-/// Bits of each signal, in two's complement, in eighths: -2048 stands for -256, 2047 for 255.875.
-constexpr unsigned passBits = rules::stateBits;
 
 /// The encoder, 1 or 2, whose constituent code a half-iteration decodes: half-iteration 0 decodes the second, the
 /// interleaved one (rule 15).
@@ -50,8 +40,7 @@ public:
     /// to K + 2.
     std::int16_t value(unsigned signal, std::uint32_t step) const;
 
-    /// Whether the core computes the signal at the step: in the tail, only intrinsic values, and the forward metrics
-    /// that step K - 1 leads to. Others are 0 or meaningless.
+    /// Whether the core computes the signal at the step (stepsAfterBits). Other values are 0 or meaningless.
     bool isComputed(unsigned signal, std::uint32_t step) const;
 
 private:

@@ -61,7 +61,7 @@ tables::Table traceTable(const Selection& selection)
                             {"unit", 3, false},
                             {"thread", 2, false}}};
     for (const unsigned signal : selection.signals) {
-        table.columns.push_back({passSignals[signal], passBits, true});
+        table.columns.push_back({passSignals[signal].name, passBits, true});
     }
     return table;
 }

@@ -84,7 +84,7 @@ private:
         itsFile.beginScope("thread" + std::to_string(place.thread));
         Thread thread = {place.segment, itsFile.addWire("step", 13), itsFile.addWire("window", 4), {}};
         for (const unsigned signal : itsSelection.signals) {
-            const std::string name = passSignals[signal];
+            const std::string name = passSignals[signal].name;
             thread.signals.push_back({itsFile.addWire(name, passBits), itsFile.addReal(name + "_real")});
         }
         itsThreads.push_back(thread);

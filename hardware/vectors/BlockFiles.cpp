@@ -29,8 +29,8 @@ tables::Table blocksTable()
 tables::Table internalTable()
 {
     tables::Table table = {"internal", {{"half_iteration", 5, false}, {"step", 13, false}}};
-    for (const char* const signal : passSignals) {
-        table.columns.push_back({signal, passBits, true});
+    for (const Signal& signal : passSignals) {
+        table.columns.push_back({signal.name, passBits, true});
     }
     return table;
 }

@@ -57,8 +57,10 @@ std::optional<std::string> differenceOf(const std::vector<InternalStep>& got, co
         }
         for (std::size_t signal = 0; signal < passSignals.size(); ++signal) {
             if (got[i].values[signal] != wanted[i].values[signal]) {
-                return wrong(
-                    place + ", " + passSignals[signal], got[i].values[signal], wanted[i].values[signal], "internal");
+                return wrong(place + ", " + passSignals[signal].name,
+                             got[i].values[signal],
+                             wanted[i].values[signal],
+                             "internal");
             }
         }
     }

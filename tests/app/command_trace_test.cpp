@@ -17,7 +17,16 @@ namespace {
 
 using namespace morvik::support;
 
+using morvik::signalsOf;
+using morvik::Stage;
+
 constexpr std::size_t placeColumns = 8;  // of a row of CSV, before the signals
+
+/// The place of a stage's first signal among the signals of a row.
+constexpr std::ptrdiff_t firstOf(Stage stage)
+{
+    return signalsOf(stage).first;
+}
 
 std::vector<std::string> splitAt(char separator, const std::string& text)
 {
@@ -144,13 +153,15 @@ TEST_F(CommandTrace, TableHasTheValuesOfTheText)
         ASSERT_EQ(numbers[0], step.halfIteration);
         ASSERT_EQ(numbers[1], step.halfIteration % 2 == 0 ? 2 : 1);
         ASSERT_EQ(numbers[2], step.step);
-        EXPECT_EQ(numbers[7], step.values[0]);  // intrinsic
+        const auto signals = numbers.begin() + placeColumns - 1;
+        EXPECT_EQ(signals[firstOf(Stage::intrinsic)], step.values[0]);
         for (std::size_t i = 0; i < (step.step < 1024 ? 16 : 0); ++i) {
-            EXPECT_EQ(numbers[12 + i], step.values[1 + i]) << lines[line];  // alpha, beta
+            EXPECT_EQ(signals[firstOf(Stage::forward) + static_cast<std::ptrdiff_t>(i)], step.values[1 + i])
+                << lines[line];  // alpha, beta
         }
         if (step.step < 1024) {
-            EXPECT_EQ(numbers[28], step.values[21]);
-            EXPECT_EQ(numbers[29], step.values[22]);
+            EXPECT_EQ(signals[firstOf(Stage::ratio)], step.values[21]);
+            EXPECT_EQ(signals[firstOf(Stage::extrinsic)], step.values[22]);
         }
     }
     EXPECT_EQ(line, lines.size());
@@ -171,8 +182,11 @@ TEST_F(CommandTrace, SelectsSignalsAndUnits)
         for (std::size_t column = 0; column < placeColumns; ++column) {
             expected += whole[column] + ',';
         }
-        expected += signals[1] + ',' + signals[2] + ',' + signals[3] + ',' + signals[4] + ',' + signals[12] + ',';
-        EXPECT_EQ(few[i], expected + signals[21]);
+        for (std::ptrdiff_t g = 0; g < 4; ++g) {
+            expected += signals[firstOf(Stage::branch) + g] + ',';
+        }
+        expected += signals[firstOf(Stage::forward) + 7] + ',';
+        EXPECT_EQ(few[i], expected + signals[firstOf(Stage::ratio)]);
     }
 }
 
@@ -190,9 +204,9 @@ TEST_F(CommandTrace, ArrayHasTheValuesOfTheTable)
     const std::vector<std::string> lines =
         rows({vectors("k512.csv"), "--half-iterations", "4:5", "--signals", "beta,g"});
     morvik::trace::Selection selection;
-    for (unsigned signal = 1; signal < 21; ++signal) {
-        if (signal < 5 || signal > 12) {
-            selection.signals.push_back(signal);
+    for (const Stage stage : {Stage::branch, Stage::backward}) {
+        for (unsigned i = 0; i < signalsOf(stage).count; ++i) {
+            selection.signals.push_back(signalsOf(stage).first + i);
         }
     }
     const auto reader =
@@ -265,8 +279,8 @@ TEST_F(CommandTrace, RefusesWhatIsNotAllowed)
         expectRefused(
             {k40, "--format", "csv", "--signals=" + wrong},
             "--signals: \"" + wrong +
-                "\" is not allowed, known are intrinsic, g0 to g3 (all: g), alpha0 to alpha7 (alpha), beta0 to "
-                "beta7 (beta), llr, extrinsic" +
+                "\" is not allowed, known are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic, "
+                "and g, alpha, beta for all of a kind" +
                 help);
     };
     for (const char* const wrong : {"gamma", "alpha8", "g4", "ll"}) {

@@ -60,4 +60,17 @@ TEST(Text, CountsOneAndSeveral)
     EXPECT_EQ(plural("signal", 1), "signal");
 }
 
+TEST(Text, ListsNeighboursAsRanges)
+{
+    const auto name = [](unsigned number) {
+        return std::to_string(number);
+    };
+    const auto withinTens = [](unsigned number) {
+        return number % 10 != 0;
+    };
+    EXPECT_EQ(listed({}, name, withinTens), "");
+    EXPECT_EQ(listed({1, 2, 4, 6, 7, 8}, name, withinTens), "1, 2, 4, 6 to 8");
+    EXPECT_EQ(listed({7, 8, 9, 10, 11, 12}, name, withinTens), "7 to 9, 10 to 12");
+}
+
 }  // namespace

@@ -73,11 +73,11 @@ void write(const Values& values)
     std::cout << "half_iteration,step,signal,value\n";
     for (unsigned pass = 0; pass < values.passes(); ++pass) {
         for (unsigned step = 0; step < values.steps(); ++step) {
-            for (unsigned signal = 0; signal < signalCount; ++signal) {
+            for (unsigned signal = 0; signal < morvik::signalCount; ++signal) {
                 const Place place = {pass, signal, step};
                 if (values.has(place)) {
-                    std::cout << pass << ',' << step << ',' << morvik::passSignals[signal] << ',' << values.at(place)
-                              << '\n';
+                    std::cout << pass << ',' << step << ',' << morvik::passSignals[signal].name << ','
+                              << values.at(place) << '\n';
                 }
             }
         }

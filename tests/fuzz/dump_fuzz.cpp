@@ -24,7 +24,7 @@ NameMap mapOf(const std::string& text)
 void requireRange(const Dump& dump)
 {
     for (unsigned pass = 0; pass < passes; ++pass) {
-        for (unsigned signal = 0; signal < morvik::comparison::signalCount; ++signal) {
+        for (unsigned signal = 0; signal < morvik::signalCount; ++signal) {
             for (unsigned step = 0; step < steps; ++step) {
                 const auto value = dump.values.at({pass, signal, step});
                 require(value == Values::missing || value == Values::unknown ||

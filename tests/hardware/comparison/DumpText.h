@@ -40,8 +40,8 @@ inline void expectRefused(Reader reader, const std::string& text, const std::str
 }
 
 // The numbers of two signals.
-constexpr unsigned alpha3 = 8;
-constexpr unsigned llr = 21;
+constexpr unsigned alpha3 = signalsOf(Stage::forward).first + 3;
+constexpr unsigned llr = signalsOf(Stage::ratio).first;
 
 }  // namespace morvik::comparison
 

@@ -13,6 +13,9 @@
 namespace {
 
 using namespace morvik::comparison;
+using morvik::signalCount;
+using morvik::signalsOf;
+using morvik::Stage;
 
 morvik::SoftBlock noisyBlock(unsigned K, unsigned seed)
 {
