@@ -6,6 +6,11 @@
 #include <cstdlib>
 #include <memory>
 #include <optional>
+#include <string>
+
+#include "rules/Arithmetic.h"
+#include "rules/Formats.h"
+#include "rules/Starts.h"
 
 namespace morvik::comparison {
 
@@ -18,19 +23,71 @@ struct NamedMistake {
     Candidate::Rank rank = Candidate::telling;
 };
 
-/// Mistakes in handing on border columns. Masks are in steps: rule 11 clears three bits of 12.
-constexpr std::array<NamedMistake, 18> borderMistakes = {{
-    {{Mistake::borderMask, -1}, "the seven low bits of border metrics are not cleared (rule 11)"},
-    {{Mistake::borderMask, ~1}, "five low bits of border metrics are cleared, not seven (rule 11)"},
-    {{Mistake::borderMask, ~3}, "six low bits of border metrics are cleared, not seven (rule 11)"},
-    {{Mistake::borderMask, ~15}, "eight low bits of border metrics are cleared, not seven (rule 11)"},
-    {{Mistake::borderMask, ~31}, "nine low bits of border metrics are cleared, not seven (rule 11)"},
-    {{Mistake::borderMask, ~63}, "ten low bits of border metrics are cleared, not seven (rule 11)"},
-    {{Mistake::borderMask, ~127}, "eleven low bits of border metrics are cleared, not seven (rule 11)"},
-    {{Mistake::borderMask, ~2}, "border metrics are ANDed with 0xFFD0, not with 0xFF80 (rule 11)"},
-    {{Mistake::borderMask, ~4}, "border metrics are ANDed with 0xFFB0, not with 0xFF80 (rule 11)"},
-    {{Mistake::borderMask, ~5}, "border metrics are ANDed with 0xFFA0, not with 0xFF80 (rule 11)"},
-    {{Mistake::borderMask, ~6}, "border metrics are ANDed with 0xFF90, not with 0xFF80 (rule 11)"},
+constexpr std::array<const char*, 12> countWords = {
+    "no", "one", "two", "three", "four", "five", "six", "seven", "eight", "nine", "ten", "eleven"};
+
+constexpr unsigned lowZeros(unsigned word)
+{
+    unsigned count = 0;
+    while ((word >> count & 1U) == 0) {
+        ++count;
+    }
+    return count;
+}
+
+/// The low bits that rule 11 clears in border metrics. A dump shows those from an eighth on.
+constexpr unsigned borderZeros = lowZeros(static_cast<std::uint16_t>(rules::borderMask));
+static_assert(borderZeros > rules::stateAlignment && borderZeros < countWords.size());
+
+/// A word as "0xFF80".
+std::string hexadecimal(int word)
+{
+    std::string text = "0x";
+    for (int shift = 12; shift >= 0; shift -= 4) {
+        text += "0123456789ABCDEF"[word >> shift & 0xF];
+    }
+    return text;
+}
+
+/// A mistake in the mask, and its description.
+struct MaskMistake {
+    Mistake mistake;
+    std::string text;
+};
+
+/// Border metrics of which another number of low bits is cleared.
+std::vector<MaskMistake> otherZeros()
+{
+    const std::string right = countWords[borderZeros];
+    std::vector<MaskMistake> mistakes = {
+        {{Mistake::borderMask, -1}, "the " + right + " low bits of border metrics are not cleared (rule 11)"}};
+    for (unsigned zeros = rules::stateAlignment + 1; zeros < countWords.size(); ++zeros) {
+        if (zeros != borderZeros) {
+            mistakes.push_back({{Mistake::borderMask, -(1 << (zeros - rules::stateAlignment))},
+                                std::string(countWords[zeros]) + " low bits of border metrics are cleared, not " +
+                                    right + " (rule 11)"});
+        }
+    }
+    return mistakes;
+}
+
+/// Border metrics of which some of the bits are cleared, but not the low ones up to some bit.
+std::vector<MaskMistake> otherMasks()
+{
+    std::vector<MaskMistake> mistakes;
+    for (int cleared = 1; cleared < 1 << (borderZeros - rules::stateAlignment); ++cleared) {
+        if ((cleared & (cleared + 1)) != 0) {
+            mistakes.push_back({{Mistake::borderMask, ~cleared},
+                                "border metrics are ANDed with " +
+                                    hexadecimal(rules::shiftLeftWrap(~cleared, rules::stateAlignment)) + ", not with " +
+                                    hexadecimal(rules::borderMask) + " (rule 11)"});
+        }
+    }
+    return mistakes;
+}
+
+/// Mistakes in handing on border columns, except their mask.
+constexpr std::array<NamedMistake, 7> borderMistakes = {{
     {Mistake::borderOfThisPass,
      "border metrics are those of the other pass: this one's for those of the last one over the same code (rules 19 "
      "and 20)"},
@@ -85,9 +142,17 @@ constexpr std::array<NamedMistake, 34> namedMistakes = {{
 
 constexpr int bitsOf(Stage stage)
 {
-    constexpr int softBits = 8;
-    const bool isSoft = stage == Stage::intrinsic || stage == Stage::branch || stage == Stage::extrinsic;
-    return isSoft ? softBits : static_cast<int>(passBits);
+    switch (stage) {
+    case Stage::intrinsic:
+    case Stage::branch:
+    case Stage::extrinsic:
+        return rules::branchBits;
+    case Stage::forward:
+    case Stage::backward:
+    case Stage::ratio:
+        break;
+    }
+    return passBits;
 }
 
 constexpr int signExtended(int value, int bits)
@@ -139,6 +204,8 @@ public:
 
     std::vector<Candidate> all(const std::vector<Fault>& faults)
     {
+        addMasks(otherZeros());
+        addMasks(otherMasks());
         addNamed(borderMistakes, Candidate::borders);
         addNamed(namedMistakes, Candidate::operation);
         const int bits = bitsOf(stageOf(faults.front().place.signal));
@@ -156,14 +223,26 @@ public:
     }
 
 private:
+    void addMistake(Mistake mistake, const std::string& text, Candidate::Rank rank, Candidate::Reach reach)
+    {
+        const auto columns = std::make_shared<Columns>(itsReplay, mistake);
+        itsCandidates.push_back({text, rank, reach, [columns](const Sample& sample) {
+                                     return columns->fit(sample.place, sample.got);
+                                 }});
+    }
+
     template <class Mistakes>
     void addNamed(const Mistakes& mistakes, Candidate::Reach reach)
     {
         for (const NamedMistake& each : mistakes) {
-            const auto columns = std::make_shared<Columns>(itsReplay, each.mistake);
-            itsCandidates.push_back({each.text, each.rank, reach, [columns](const Sample& sample) {
-                                         return columns->fit(sample.place, sample.got);
-                                     }});
+            addMistake(each.mistake, each.text, each.rank, reach);
+        }
+    }
+
+    void addMasks(const std::vector<MaskMistake>& mistakes)
+    {
+        for (const MaskMistake& each : mistakes) {
+            addMistake(each.mistake, each.text, Candidate::telling, Candidate::borders);
         }
     }
 
