@@ -111,7 +111,7 @@ stage_memory-short() {
     local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance'
     local long="BerRuns|MpiRuns|Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore"
     local scripts='example_sweep|core_from_document|default_core'
-    memory_without "^($long|CommandTrace\.NeedsNoMore|DefaultScaleTest\.HalfAnd|($scripts)\$)"
+    memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"
 }
 
 # memory_without REGEX: a pattern of test names

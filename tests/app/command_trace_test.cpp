@@ -57,7 +57,7 @@ long largestProcess()
     return usage.ru_maxrss;
 }
 
-class CommandTrace : public CommandTest {
+class Trace : public CommandTest {
 protected:
     CommandResult trace(const std::vector<std::string>& arguments, const std::string& output = "") const
     {
@@ -111,7 +111,7 @@ protected:
     }
 };
 
-TEST_F(CommandTrace, TextIsTheTraceOfTheLibrary)
+TEST_F(Trace, TextIsTheTraceOfTheLibrary)
 {
     for (const char* const name : {"k40.csv", "k1024.csv"}) {
         const std::vector<std::string> options = {"--num-pu", "4", "--algorithm", "2", "--iterations", "3"};
@@ -123,7 +123,7 @@ TEST_F(CommandTrace, TextIsTheTraceOfTheLibrary)
     }
 }
 
-TEST_F(CommandTrace, TextKeepsInputsAndChosenPasses)
+TEST_F(Trace, TextKeepsInputsAndChosenPasses)
 {
     const std::string whole = traced({vectors("k40.csv")});
     const std::string dashes = std::string(289, '-') + "\ndecode=0 siso=";
@@ -137,7 +137,7 @@ TEST_F(CommandTrace, TextKeepsInputsAndChosenPasses)
               whole.substr(0, begin(0)) + whole.substr(begin(15)));
 }
 
-TEST_F(CommandTrace, TableHasTheValuesOfTheText)
+TEST_F(Trace, TableHasTheValuesOfTheText)
 {
     const std::vector<std::string> lines = rows({vectors("k1024.csv"), "--half-iterations", "1:2"});
     EXPECT_EQ(lines.front(),
@@ -167,7 +167,7 @@ TEST_F(CommandTrace, TableHasTheValuesOfTheText)
     EXPECT_EQ(line, lines.size());
 }
 
-TEST_F(CommandTrace, SelectsSignalsAndUnits)
+TEST_F(Trace, SelectsSignalsAndUnits)
 {
     const std::vector<std::string> all = rows({vectors("k1024.csv"), "--half-iterations", "3"});
     const std::vector<std::string> few =
@@ -190,7 +190,7 @@ TEST_F(CommandTrace, SelectsSignalsAndUnits)
     }
 }
 
-TEST_F(CommandTrace, ArrayHasTheValuesOfTheTable)
+TEST_F(Trace, ArrayHasTheValuesOfTheTable)
 {
     traced({vectors("k512.csv"),
             "--half-iterations",
@@ -218,7 +218,7 @@ TEST_F(CommandTrace, ArrayHasTheValuesOfTheTable)
     EXPECT_EQ(line, lines.size());
 }
 
-TEST_F(CommandTrace, TracesEachBlockOnItsOwn)
+TEST_F(Trace, TracesEachBlockOnItsOwn)
 {
     const std::vector<std::string> lines = rows({vectors("k40.csv"), "--block", "2", "--half-iterations", "0"});
     EXPECT_EQ(lines[1].rfind("2,0,2,0,", 0), 0U) << lines[1];
@@ -232,7 +232,7 @@ TEST_F(CommandTrace, TracesEachBlockOnItsOwn)
     EXPECT_NE(traced({vectors("k40.csv")}), traced({"alone.csv"}));
 }
 
-TEST_F(CommandTrace, KeepsWarningsOutOfTables)
+TEST_F(Trace, KeepsWarningsOutOfTables)
 {
     morvik.write("wide.csv", withLine(header + '\n' + zeroRows("0", 44), 3, "0,999,-64,-64"));
     const std::string warning =
@@ -246,7 +246,7 @@ TEST_F(CommandTrace, KeepsWarningsOutOfTables)
 }
 
 /// Whatever the length of the trace: what thirty passes add to one would be 20 MB at least.
-TEST_F(CommandTrace, NeedsNoMoreMemoryForMorePasses)
+TEST_F(Trace, NeedsNoMoreMemoryForMorePasses)
 {
     setenv("ASAN_OPTIONS", "quarantine_size_mb=1", 0);  // the address sanitizer keeps freed memory
     for (const std::string format : {"text", "csv", "npy", "vcd"}) {
@@ -262,7 +262,7 @@ TEST_F(CommandTrace, NeedsNoMoreMemoryForMorePasses)
     }
 }
 
-TEST_F(CommandTrace, RefusesWhatIsNotAllowed)
+TEST_F(Trace, RefusesWhatIsNotAllowed)
 {
     const std::string help = "; 'morvik trace --help' tells what is allowed";
     const std::string k40 = vectors("k40.csv");
@@ -301,7 +301,7 @@ TEST_F(CommandTrace, RefusesWhatIsNotAllowed)
     expectRefused({k40, "--format", "npy"}, "--format npy needs a regular file, by --output FILE");
 }
 
-TEST_F(CommandTrace, TellsWhatIsWrongWithFiles)
+TEST_F(Trace, TellsWhatIsWrongWithFiles)
 {
     const std::string k40 = vectors("k40.csv");
     expectRefused({"nowhere.csv"}, "nowhere.csv: cannot be opened: No such file or directory");

@@ -9,7 +9,7 @@ namespace {
 
 using namespace morvik::support;
 
-class CommandVectors : public CommandTest {
+class Vectors : public CommandTest {
 protected:
     CommandResult vectors(const std::vector<std::string>& arguments) const
     {
@@ -27,7 +27,7 @@ protected:
     }
 };
 
-TEST_F(CommandVectors, MakesASetAndChecksIt)
+TEST_F(Vectors, MakesASetAndChecksIt)
 {
     const CommandResult made = vectors({"--out", "set", "--block-size", "48,40", "--blocks", "2", "--no-directed"});
     EXPECT_EQ(made.status, 0) << made.err;
@@ -43,7 +43,7 @@ TEST_F(CommandVectors, MakesASetAndChecksIt)
     EXPECT_EQ(one.out, core + "set: 1 block in memh\n");
 }
 
-TEST_F(CommandVectors, WritesWhatDecodeReads)
+TEST_F(Vectors, WritesWhatDecodeReads)
 {
     vectors({"--out", "set", "--block-size", "40", "--format", "csv", "--num-pu", "8", "--algorithm", "table"});
     const CommandResult decoded = morvik.run({"decode", "set/stimulus.csv", "--num-pu", "8", "--algorithm", "table"});
@@ -75,7 +75,7 @@ std::string withoutPlace(const std::string& row)
     return kept.substr(1);
 }
 
-TEST_F(CommandVectors, ExpectsInsideWhatTraceShows)
+TEST_F(Vectors, ExpectsInsideWhatTraceShows)
 {
     vectors({"--out", "set", "--block-size", "512", "--blocks", "1", "--no-directed", "--format", "csv", "--internal"});
     const CommandResult traced = morvik.run({"trace", "set/stimulus.csv", "--format", "csv"});
@@ -92,7 +92,7 @@ TEST_F(CommandVectors, ExpectsInsideWhatTraceShows)
     EXPECT_FALSE(std::getline(trace, step)) << step;
 }
 
-TEST_F(CommandVectors, NamesTheCommandThatMakesTheSetAgain)
+TEST_F(Vectors, NamesTheCommandThatMakesTheSetAgain)
 {
     const std::vector<std::string> arguments = {
         "--block-size",  "40",       "--num-pu", "4",       "--algorithm", "max-log",   "--iterations", "3",
@@ -109,7 +109,7 @@ TEST_F(CommandVectors, NamesTheCommandThatMakesTheSetAgain)
     EXPECT_EQ(nlohmann::json::parse(morvik.read("first/manifest.json"))["command"], expected);
 }
 
-TEST_F(CommandVectors, TellsADifference)
+TEST_F(Vectors, TellsADifference)
 {
     const CommandResult made =
         vectors({"--out", "set", "--block-size", "40", "--blocks", "1", "--no-directed", "--format", "csv", "--soft"});
@@ -124,7 +124,7 @@ TEST_F(CommandVectors, TellsADifference)
     EXPECT_EQ(checked.out.rfind(told, 0), 0U) << checked.out;
 }
 
-TEST_F(CommandVectors, RefusesWhatIsNotAllowed)
+TEST_F(Vectors, RefusesWhatIsNotAllowed)
 {
     const std::string help = "; 'morvik vectors --help' tells what is allowed";
     const std::string required =
@@ -154,7 +154,7 @@ TEST_F(CommandVectors, RefusesWhatIsNotAllowed)
     expectRefused({"--check", "nowhere"}, "nowhere/manifest.json: cannot be opened: No such file or directory");
 }
 
-TEST_F(CommandVectors, ReportsAFullDisk)
+TEST_F(Vectors, ReportsAFullDisk)
 {
     const CommandResult result =
         morvik.run({"vectors", "--out", "set", "--block-size", "40"}, "/dev/null", "/dev/full");

@@ -19,10 +19,11 @@
 #include "support/Blocks.h"
 #include "support/Environment.h"
 
+namespace lanes = morvik::lanes;
+
 namespace {
 
 using morvik::lanes::Algorithm;
-using morvik::lanes::LaneDecoder;
 using morvik::rules::Cut;
 
 /// 6 steps up to a magnitude of 63, 4 up to 127, and so on (rule 9), by quarters of a magnitude in steps.
@@ -91,7 +92,7 @@ std::vector<Results> componentResults(Components& components, const morvik::bloc
 }
 
 /// Decodes the blocks, as many at once as the decoder likes.
-std::vector<Results> laneResults(LaneDecoder& decoder,
+std::vector<Results> laneResults(lanes::LaneDecoder& decoder,
                                  const std::vector<morvik::blocks::Block>& blocks,
                                  unsigned passes)
 {
@@ -127,7 +128,7 @@ std::string nameOf(Algorithm algorithm)
     return "type " + std::to_string(static_cast<int>(algorithm));
 }
 
-class LaneDecoderTest : public testing::TestWithParam<const morvik::lanes::InstructionSet*> {
+class LaneDecoder : public testing::TestWithParam<const morvik::lanes::InstructionSet*> {
 protected:
     /// The lanes of the widest row.
     static unsigned lanesOfRow()
@@ -143,7 +144,7 @@ protected:
                         unsigned passes)
     {
         Components components(units, algorithm);
-        LaneDecoder decoder(*GetParam(), algorithm, corrections);
+        lanes::LaneDecoder decoder(*GetParam(), algorithm, corrections);
         decoder.setCut(Cut(K, units));
         std::vector<std::vector<Results>> expected;
         expected.reserve(blocks.size());
@@ -201,7 +202,7 @@ morvik::blocks::Block blockOf(morvik::blocks::Random& random, unsigned K, unsign
     return morvik::blocks::randomBlock(random, K, values[kind]);
 }
 
-void LaneDecoderTest::compareRandomBlocks(const std::vector<unsigned>& sizes)
+void LaneDecoder::compareRandomBlocks(const std::vector<unsigned>& sizes)
 {
     morvik::blocks::Random random(1);
     for (const unsigned K : sizes) {
@@ -316,18 +317,18 @@ std::vector<unsigned> batchSizes(unsigned capacity)
     return {1, capacity, capacity + 1, 3, 2 * capacity + 1};
 }
 
-TEST_P(LaneDecoderTest, EveryValueOfEveryPassIsThatOfTheComponents)
+TEST_P(LaneDecoder, EveryValueOfEveryPassIsThatOfTheComponents)
 {
     compareRandomBlocks({256, 504, 512, 1024, 1056, 2048, 2112, 3136, 6080, 6144});
 }
 
 /// scripts/mutate runs these first.
-TEST_P(LaneDecoderTest, EveryValueOfShortBlocksIsThatOfTheComponents)
+TEST_P(LaneDecoder, EveryValueOfShortBlocksIsThatOfTheComponents)
 {
     compareRandomBlocks({40, 48, 120, 128, 136});
 }
 
-TEST_P(LaneDecoderTest, WorstBlocksAreDecodedAlike)
+TEST_P(LaneDecoder, WorstBlocksAreDecodedAlike)
 {
     morvik::blocks::Random random(2);
     for (const unsigned K : {40U, 48U, 56U, 128U, 512U, 1056U, 6144U}) {
@@ -341,7 +342,7 @@ TEST_P(LaneDecoderTest, WorstBlocksAreDecodedAlike)
     }
 }
 
-TEST_P(LaneDecoderTest, TiesAreDecodedAlike)
+TEST_P(LaneDecoder, TiesAreDecodedAlike)
 {
     morvik::blocks::Random random(3);
     for (const unsigned K : {40U, 48U, 264U, 2048U}) {
@@ -356,7 +357,7 @@ template <class Input>
 void expectEachNoticed(const morvik::lanes::InstructionSet& instructionSet, Input beyond)
 {
     constexpr unsigned K = 40;
-    LaneDecoder decoder(instructionSet, Algorithm::greatest, corrections);
+    lanes::LaneDecoder decoder(instructionSet, Algorithm::greatest, corrections);
     decoder.setCut(Cut(K, 2));
     for (const Input within : {Input{-128}, Input{127}}) {
         std::vector<Input> values(3 * (K + 4), within);
@@ -370,7 +371,7 @@ void expectEachNoticed(const morvik::lanes::InstructionSet& instructionSet, Inpu
     }
 }
 
-TEST_P(LaneDecoderTest, EachValueBeyondTheFormatIsNoticed)
+TEST_P(LaneDecoder, EachValueBeyondTheFormatIsNoticed)
 {
     for (const std::int16_t beyond : std::vector<std::int16_t>{128, -129, 32767, -32768}) {
         expectEachNoticed<std::int32_t>(*GetParam(), beyond);
@@ -389,7 +390,7 @@ constexpr unsigned combinationsPerOneTaken = 17;
 
 /// Each block size with each number of units and each algorithm type, each of them with another number of
 /// blocks and passes. MORVIK_TEST_BLOCKS, other than 0, asks for all numbers of blocks with all of them.
-TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
+TEST_P(LaneDecoder, EveryBlockSizeIsDecodedAlike)
 {
     const unsigned seed = fromEnvironment("MORVIK_TEST_SEED", 4);
     const bool all = fromEnvironment("MORVIK_TEST_BLOCKS", 0) != 0;
@@ -421,7 +422,7 @@ TEST_P(LaneDecoderTest, EveryBlockSizeIsDecodedAlike)
 }
 
 INSTANTIATE_TEST_SUITE_P(InstructionSets,
-                         LaneDecoderTest,
+                         LaneDecoder,
                          testing::ValuesIn(morvik::lanes::availableInstructionSets()),
                          [](const auto& set) { return std::string(set.param->name); });
 

@@ -32,7 +32,7 @@ void expectExact(const Weights& weights)
 
 }  // namespace
 
-TEST(AliasTableTest, KeepsThresholdsInTwoParts)
+TEST(AliasTable, KeepsThresholdsInTwoParts)
 {
     Weights weights{};
     weights[3] = 0x12FFFFFFFE;  // a poor one among 255 that share the rest
@@ -44,14 +44,14 @@ TEST(AliasTableTest, KeepsThresholdsInTwoParts)
     EXPECT_EQ(table.alias[3], 4);
 }
 
-TEST(AliasTableTest, DrawsEqualWeights)
+TEST(AliasTable, DrawsEqualWeights)
 {
     Weights weights;
     weights.fill(entryRoom);
     expectExact(weights);
 }
 
-TEST(AliasTableTest, DrawsASingleValue)
+TEST(AliasTable, DrawsASingleValue)
 {
     for (const unsigned value : {0U, 127U, 128U, 255U}) {
         Weights weights{};
@@ -60,7 +60,7 @@ TEST(AliasTableTest, DrawsASingleValue)
     }
 }
 
-TEST(AliasTableTest, DrawsWeightsOfVeryDifferentSize)
+TEST(AliasTable, DrawsWeightsOfVeryDifferentSize)
 {
     Weights weights{};
     std::uint64_t left = whole;
@@ -73,7 +73,7 @@ TEST(AliasTableTest, DrawsWeightsOfVeryDifferentSize)
     expectExact(weights);
 }
 
-TEST(AliasTableTest, DrawsRandomWeights)
+TEST(AliasTable, DrawsRandomWeights)
 {
     std::mt19937_64 random(1);
     for (unsigned round = 0; round < 100; ++round) {

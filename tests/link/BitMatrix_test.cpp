@@ -5,7 +5,7 @@
 
 #include <random>
 
-TEST(BitMatrixTest, ExchangesRowsAndColumns)
+TEST(BitMatrix, ExchangesRowsAndColumns)
 {
     std::mt19937_64 random(1);
     for (unsigned round = 0; round < 20; ++round) {
@@ -23,7 +23,7 @@ TEST(BitMatrixTest, ExchangesRowsAndColumns)
     }
 }
 
-TEST(BitMatrixTest, MovesSingleBits)
+TEST(BitMatrix, MovesSingleBits)
 {
     for (unsigned r = 0; r < 64; ++r) {
         for (unsigned c = 0; c < 64; ++c) {

@@ -34,7 +34,7 @@ double probability(const RoundedDistribution& distribution, int value)
 
 }  // namespace
 
-TEST(ChannelTest, CountsTheTailInTheEnergyOfABit)
+TEST(Channel, CountsTheTailInTheEnergyOfABit)
 {
     // K = 40: 132 values carry 40 bits. At 0 dB the variance is 132 / (2 * 40).
     EXPECT_NEAR(static_cast<double>(noiseDeviation(40, 0)), std::sqrt(1.65), 1e-15);
@@ -44,7 +44,7 @@ TEST(ChannelTest, CountsTheTailInTheEnergyOfABit)
     EXPECT_NEAR(static_cast<double>(noiseDeviation(6144, 1) / noiseDeviation(6144, 0)), std::pow(10, -0.00005), 1e-15);
 }
 
-TEST(ChannelTest, ProbabilitiesSumToOneExactly)
+TEST(Channel, ProbabilitiesSumToOneExactly)
 {
     for (const double scale : {1e-6, 0.1, 1.0, 7.3, 8.0, 31.5, 200.0, 1e9}) {
         for (const int milliDecibels : {-20000, -1234, 0, 500, 4000, 20000, 60000}) {
@@ -56,7 +56,7 @@ TEST(ChannelTest, ProbabilitiesSumToOneExactly)
     }
 }
 
-TEST(ChannelTest, ProbabilitiesAreThoseOfTheDensity)
+TEST(Channel, ProbabilitiesAreThoseOfTheDensity)
 {
     for (const double scale : {2.0, 8.0, 40.0}) {
         const double deviation = 0.9;
@@ -72,7 +72,7 @@ TEST(ChannelTest, ProbabilitiesAreThoseOfTheDensity)
     }
 }
 
-TEST(ChannelTest, TheEndsAreDividedUp)
+TEST(Channel, TheEndsAreDividedUp)
 {
     constexpr double scale = 100;
     const double deviation = 0.8;
@@ -91,7 +91,7 @@ TEST(ChannelTest, TheEndsAreDividedUp)
                 1e-6);
 }
 
-TEST(ChannelTest, EndsThatAreNeverReachedAreNotDivided)
+TEST(Channel, EndsThatAreNeverReachedAreNotDivided)
 {
     const RoundedDistribution distribution = roundedDistribution(0.001L, 8);
     EXPECT_EQ(distribution.weights[8], whole);
@@ -100,7 +100,7 @@ TEST(ChannelTest, EndsThatAreNeverReachedAreNotDivided)
     EXPECT_EQ(distribution.bottom, std::uint64_t{1} << 32);
 }
 
-TEST(ChannelTest, ClipsToEightBits)
+TEST(Channel, ClipsToEightBits)
 {
     for (int rounded = -200; rounded <= 200; ++rounded) {
         const SoftValue soft = SoftValue::of(rounded);

@@ -49,7 +49,7 @@ unsigned blockErrors(int type, int milliDecibels, double scale)
 
 }  // namespace
 
-TEST(DefaultScaleTest, IsEightStepsWithoutACorrectionTable)
+TEST(DefaultScale, IsEightStepsWithoutACorrectionTable)
 {
     for (const int type : {0, 1}) {
         for (const int milliDecibels : {-1000, 0, 5000}) {
@@ -59,7 +59,7 @@ TEST(DefaultScaleTest, IsEightStepsWithoutACorrectionTable)
     }
 }
 
-TEST(DefaultScaleTest, IsEightStepsOverTheVarianceWithACorrectionTable)
+TEST(DefaultScale, IsEightStepsOverTheVarianceWithACorrectionTable)
 {
     // K = 40 at 0 dB has the variance 132 / 80, and 10 dB more make it a tenth.
     EXPECT_NEAR(defaultScale(2, 40, 0), 8 * 80 / 132.0, 1e-12);
@@ -67,7 +67,7 @@ TEST(DefaultScaleTest, IsEightStepsOverTheVarianceWithACorrectionTable)
     EXPECT_NEAR(defaultScale(2, 6144, 0), 8 * 2 * 6144 / 18444.0, 1e-12);
 }
 
-TEST(DefaultScaleTest, HalfAndThreeTimesTheScaleAreWorse)
+TEST(DefaultScale, HalfAndThreeTimesTheScaleAreWorse)
 {
     for (const auto& [type, milliDecibels] : {std::pair{0, 1000}, std::pair{1, 800}, std::pair{2, 700}}) {
         const double scale = defaultScale(type, K, milliDecibels);

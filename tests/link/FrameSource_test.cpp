@@ -103,7 +103,7 @@ class EveryFrameSource : public testing::TestWithParam<SamplerForm> {};
 
 }  // namespace
 
-TEST(FrameSourceTest, RefusesWhatNoPointCanBe)
+TEST(FrameSource, RefusesWhatNoPointCanBe)
 {
     constexpr double nan = std::numeric_limits<double>::quiet_NaN();
     constexpr double infinity = std::numeric_limits<double>::infinity();
@@ -118,7 +118,7 @@ TEST(FrameSourceTest, RefusesWhatNoPointCanBe)
     EXPECT_NO_THROW(FrameSource(40, -262144, 8, 0));
 }
 
-TEST(FrameSourceTest, FramesFitTheBatchInterfaceAndDecode)
+TEST(FrameSource, FramesFitTheBatchInterfaceAndDecode)
 {
     for (const unsigned K : {40U, 48U, 104U, 512U, 1504U, 6144U}) {
         FrameSource source(K, 6000, 8, 1);
@@ -138,7 +138,7 @@ TEST(FrameSourceTest, FramesFitTheBatchInterfaceAndDecode)
     }
 }
 
-TEST(FrameSourceTest, MakesNoFrames)
+TEST(FrameSource, MakesNoFrames)
 {
     FrameSource source(40, 0, 8, 1);
     Frames frames = made(source, 0, 5);
@@ -178,7 +178,7 @@ TEST_P(EveryFrameSource, FramesAreThoseThatHaveBeenPromised)
 
 INSTANTIATE_TEST_SUITE_P(Forms, EveryFrameSource, everySamplerForm(), samplerFormName);
 
-TEST(FrameSourceTest, FramesSeedsAndPointsDiffer)
+TEST(FrameSource, FramesSeedsAndPointsDiffer)
 {
     FrameSource source(104, 1000, 8, 1);
     const Frames frame = made(source, 0, 1);
@@ -198,7 +198,7 @@ TEST(FrameSourceTest, FramesSeedsAndPointsDiffer)
     expectOther(made(otherPoint, 0, 1));
 }
 
-TEST(FrameSourceTest, ScaleAndKindOfNoiseLeaveTheBitsAlone)
+TEST(FrameSource, ScaleAndKindOfNoiseLeaveTheBitsAlone)
 {
     FrameSource source(512, 1000, 8, 1);
     const Frames frames = made(source, 3, 10);
@@ -212,7 +212,7 @@ TEST(FrameSourceTest, ScaleAndKindOfNoiseLeaveTheBitsAlone)
 }
 
 // The two ways to make soft values draw from one distribution, for the systematic bits of either value.
-TEST(FrameSourceTest, DrawsWhatGaussianNumbersGive)
+TEST(FrameSource, DrawsWhatGaussianNumbersGive)
 {
     for (const double scale : {6.5, 20.0, 100.0}) {
         std::array<std::vector<double>, 4> counts;  // of discrete and gaussian noise, each of 0 and 1
@@ -235,7 +235,7 @@ TEST(FrameSourceTest, DrawsWhatGaussianNumbersGive)
     }
 }
 
-TEST(FrameSourceTest, GaussianFramesAreTheSameHoweverTheRangeIsCut)
+TEST(FrameSource, GaussianFramesAreTheSameHoweverTheRangeIsCut)
 {
     FrameSource source(40, 500, 50, 9, Noise::gaussian);
     const Frames whole = made(source, 0, 70);

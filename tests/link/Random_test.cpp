@@ -14,7 +14,7 @@ using namespace morvik::link;
 }  // namespace
 
 // The known answers that Random123 publishes for philox4x32 with ten rounds.
-TEST(RandomTest, GivesTheGeneratorsKnownAnswers)
+TEST(Random, GivesTheGeneratorsKnownAnswers)
 {
     EXPECT_EQ(randomBlock({0, 0}, 0, 0), (RandomBlock{0x6627E8D5, 0xE169C58D, 0xBC57AC4C, 0x9B00DBD8}));
     constexpr std::uint64_t ones = ~std::uint64_t{0};
@@ -24,7 +24,7 @@ TEST(RandomTest, GivesTheGeneratorsKnownAnswers)
               (RandomBlock{0xD16CFE09, 0x94FDCCEB, 0x5001E420, 0x24126EA1}));
 }
 
-TEST(RandomTest, PutsSeedFramePointAndIndexIntoKeyAndCounter)
+TEST(Random, PutsSeedFramePointAndIndexIntoKeyAndCounter)
 {
     const RandomKey key = randomKey(0x123456789ABCDEF0);
     EXPECT_EQ(key, (RandomKey{0x9ABCDEF0, 0x12345678}));
@@ -34,7 +34,7 @@ TEST(RandomTest, PutsSeedFramePointAndIndexIntoKeyAndCounter)
     EXPECT_EQ(negative.block(0xFFFFFFFF), randomBlock(key, 0xFFFFFFFF, (40ULL << 19 | 0x7FFFF) << 32));
 }
 
-TEST(RandomTest, KeepsWhatNumbersAreForApart)
+TEST(Random, KeepsWhatNumbersAreForApart)
 {
     // A frame has at most 3 * 8192 soft values, of which each has its number.
     constexpr std::uint32_t most = 3 * 8192;
@@ -43,7 +43,7 @@ TEST(RandomTest, KeepsWhatNumbersAreForApart)
     EXPECT_LT(random_index::refinements + most, random_index::gaussian);
 }
 
-TEST(RandomTest, DrawsTheSameInBulk)
+TEST(Random, DrawsTheSameInBulk)
 {
     const RandomKey key = randomKey(99);
     constexpr std::uint64_t guard = 0x5555555555555555;

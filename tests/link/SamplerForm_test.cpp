@@ -138,7 +138,7 @@ TEST_P(EverySamplerForm, DrawsAnyNumberOfGroups)
 
 INSTANTIATE_TEST_SUITE_P(Forms, EverySamplerForm, everySamplerForm(), samplerFormName);
 
-TEST(SamplerFormTest, TheMachinesFormsAreNamedAndEndWithTheGenericOne)
+TEST(SamplerForm, TheMachinesFormsAreNamedAndEndWithTheGenericOne)
 {
     std::vector<std::string> names;
     for (const SamplerForm& form : samplerForms()) {

@@ -153,7 +153,7 @@ TEST_P(EverySampler, DrawsSeveralFramesTogether)
 
 INSTANTIATE_TEST_SUITE_P(Forms, EverySampler, everySamplerForm(), samplerFormName);
 
-TEST(SoftValueSamplerTest, ValuesHaveTheirProbabilities)
+TEST(SoftValueSampler, ValuesHaveTheirProbabilities)
 {
     for (const double scale : {3.0, 8.0, 40.0, 127.0}) {
         for (const bool bit : {true, false}) {
@@ -170,7 +170,7 @@ TEST(SoftValueSamplerTest, ValuesHaveTheirProbabilities)
     }
 }
 
-TEST(SoftValueSamplerTest, CountsClippedValues)
+TEST(SoftValueSampler, CountsClippedValues)
 {
     for (const double scale : {8.0, 40.0, 127.0, 1000.0}) {
         for (const bool bit : {true, false}) {

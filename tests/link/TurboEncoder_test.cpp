@@ -76,14 +76,14 @@ std::array<bool, 12> tailOf(const TurboEncoder::Streams& streams, unsigned block
 
 }  // namespace
 
-TEST(TurboEncoderTest, RefusesWhatIsNoBlockSize)
+TEST(TurboEncoder, RefusesWhatIsNoBlockSize)
 {
     for (const unsigned K : {0U, 32U, 41U, 520U, 6145U, 6208U}) {
         EXPECT_THROW(TurboEncoder{K}, std::invalid_argument) << K;
     }
 }
 
-TEST(TurboEncoderTest, EncodesAsAPlainEncoderDoesForAllSizes)
+TEST(TurboEncoder, EncodesAsAPlainEncoderDoesForAllSizes)
 {
     morvik::blocks::Random random(1);
     for (const unsigned K : morvik::blocks::blockSizes()) {
@@ -107,7 +107,7 @@ TEST(TurboEncoderTest, EncodesAsAPlainEncoderDoesForAllSizes)
     }
 }
 
-TEST(TurboEncoderTest, EndsBothTrellisesInStateZero)
+TEST(TurboEncoder, EndsBothTrellisesInStateZero)
 {
     morvik::blocks::Random random(2);
     for (const unsigned K : morvik::blocks::blockSizes()) {
@@ -133,7 +133,7 @@ TEST(TurboEncoderTest, EndsBothTrellisesInStateZero)
     }
 }
 
-TEST(TurboEncoderTest, TheCodeIsLinear)
+TEST(TurboEncoder, TheCodeIsLinear)
 {
     morvik::blocks::Random random(3);
     for (const unsigned K : {40U, 48U, 56U, 64U, 120U, 512U, 1504U, 6144U}) {
@@ -158,7 +158,7 @@ TEST(TurboEncoderTest, TheCodeIsLinear)
     }
 }
 
-TEST(TurboEncoderTest, ForgetsTheBlocksOfTheCallBefore)
+TEST(TurboEncoder, ForgetsTheBlocksOfTheCallBefore)
 {
     morvik::blocks::Random random(4);
     TurboEncoder encoder(104);
@@ -174,7 +174,7 @@ TEST(TurboEncoderTest, ForgetsTheBlocksOfTheCallBefore)
 
 // The blocks came through noise: of every hundred values, five to twenty have the wrong sign, but an encoder that
 // disagreed would have fifty.
-TEST(TurboEncoderTest, AgreesWithTheBlocksOfAnotherEncoder)
+TEST(TurboEncoder, AgreesWithTheBlocksOfAnotherEncoder)
 {
     std::array<int, 12> tail{};  // by their place, how far the tail's values lie on the right side
     std::array<int, 12> magnitude{};
@@ -208,7 +208,7 @@ TEST(TurboEncoderTest, AgreesWithTheBlocksOfAnotherEncoder)
     }
 }
 
-TEST(TurboEncoderTest, IsUnderstoodByTheDecoder)
+TEST(TurboEncoder, IsUnderstoodByTheDecoder)
 {
     morvik::blocks::Random random(5);
     morvik::blocks::Decoder decoder(4, 1);

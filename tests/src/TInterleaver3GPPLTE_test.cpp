@@ -14,10 +14,10 @@ namespace {
 
 using Table = std::vector<unsigned>;
 
-class TInterleaver3GPPLTETest : public testing::Test {
-protected:
-    const std::unique_ptr<TInterleaver> interleaver{TInterleaver3GPPLTE::create("")};
-};
+std::unique_ptr<TInterleaver> made()
+{
+    return std::unique_ptr<TInterleaver>(TInterleaver3GPPLTE::create(""));
+}
 
 Table first(const Table& table, std::size_t count)
 {
@@ -31,7 +31,7 @@ Table last(const Table& table, std::size_t count)
 
 }  // namespace
 
-TEST_F(TInterleaver3GPPLTETest, TakesNoProperties)
+TEST(TInterleaver3GPPLTE, TakesNoProperties)
 {
     const CapturedStreams streams;
     EXPECT_EQ(std::unique_ptr<TInterleaver>(TInterleaver3GPPLTE::create("x")), nullptr);
@@ -39,8 +39,9 @@ TEST_F(TInterleaver3GPPLTETest, TakesNoProperties)
     EXPECT_EQ(streams.out(), "");
 }
 
-TEST_F(TInterleaver3GPPLTETest, KnowsTheBlockSizesAtTheBordersOfTheirSteps)
+TEST(TInterleaver3GPPLTE, KnowsTheBlockSizesAtTheBordersOfTheirSteps)
 {
+    const auto interleaver = made();
     for (const unsigned K : {40U, 512U, 528U, 1024U, 1056U, 2048U, 2112U, 6144U}) {
         EXPECT_TRUE(interleaver->valid(K)) << K;
     }
@@ -49,8 +50,9 @@ TEST_F(TInterleaver3GPPLTETest, KnowsTheBlockSizesAtTheBordersOfTheirSteps)
     }
 }
 
-TEST_F(TInterleaver3GPPLTETest, PermutesEveryBlockSizeAsThePolynomialSaysAndEmptiesTheTableForOthers)
+TEST(TInterleaver3GPPLTE, PermutesEveryBlockSizeAsThePolynomialSaysAndEmptiesTheTableForOthers)
 {
+    const auto interleaver = made();
     unsigned sizes = 0;
     for (unsigned K = 0; K <= 6208; ++K) {
         Table table{9, 9, 9};
@@ -67,8 +69,9 @@ TEST_F(TInterleaver3GPPLTETest, PermutesEveryBlockSizeAsThePolynomialSaysAndEmpt
     EXPECT_EQ(sizes, 188U);
 }
 
-TEST_F(TInterleaver3GPPLTETest, GivesTheKnownPermutationsOfTheSmallestAndTheLargestBlock)
+TEST(TInterleaver3GPPLTE, GivesTheKnownPermutationsOfTheSmallestAndTheLargestBlock)
 {
+    const auto interleaver = made();
     Table pi;
     interleaver->calcInterleaver(pi, 40);
     EXPECT_EQ(first(pi, 10), (Table{0, 13, 6, 19, 12, 25, 18, 31, 24, 37}));

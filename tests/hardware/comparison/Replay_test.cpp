@@ -103,7 +103,7 @@ TEST(Replay, GivesWhatMistakesGive)
     EXPECT_EQ(replay.column(2, Stage::forward, 64, Mistake::borderUnknown).values, Column().values);
 }
 
-TEST(FindShifts, TellsNoneOfValuesThatAreAlikeInAllPasses)
+TEST(Patterns, FindNoShiftOfValuesThatAreAlikeInAllPasses)
 {
     morvik::blocks::Random random(1);
     const morvik::blocks::Block block = morvik::blocks::encode(morvik::blocks::randomBits(random, 128), 60);
@@ -121,7 +121,7 @@ TEST(FindShifts, TellsNoneOfValuesThatAreAlikeInAllPasses)
     EXPECT_TRUE(findShifts(model, dump).empty());
 }
 
-TEST(FindShifts, TellsOfADumpThatIsLate)
+TEST(Patterns, FindADumpThatIsLate)
 {
     const Model model = modelOf(128, 2, 1, 4);
     Values dump(model.values.passes(), model.values.steps());
@@ -136,7 +136,7 @@ TEST(FindShifts, TellsOfADumpThatIsLate)
     EXPECT_EQ(found.front().find("the dump is a pass late, or counts half-iterations from 1"), 0U) << found.front();
 }
 
-TEST(StepsInOrder, TakeTheSegmentsTogether)
+TEST(Model, OrdersTheStepsOfAllSegmentsTogether)
 {
     const Model model = modelOf(512, 8, 1, 1);
     const auto forward = stepsInOrder(model.cut, Stage::forward);
