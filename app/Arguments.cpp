@@ -1,6 +1,7 @@
 // Arguments: validates option values and words the refusals.
 #include "Arguments.h"
 
+#include <algorithm>
 #include <iterator>
 #include <sstream>
 
@@ -93,22 +94,24 @@ void refuse(const std::string& option, const std::string& text, const std::strin
     throw CLI::ValidationError(option, base::shown(text) + " is not allowed, " + allowed);
 }
 
+std::string blockSizesNear(std::uint32_t K)
+{
+    const auto& sizes = rules::blockSizes;
+    if (K < sizes.front().K || K > sizes.back().K) {
+        return "allowed are the block sizes of 3GPP TS 36.212, " + std::to_string(sizes.front().K) + " to " +
+               std::to_string(sizes.back().K);
+    }
+    const auto* const above =
+        std::find_if(sizes.begin(), sizes.end(), [K](const rules::BlockSize& size) { return size.K > K; });
+    return "the nearest block sizes of 3GPP TS 36.212 are " + std::to_string((above - 1)->K) + " and " +
+           std::to_string(above->K);
+}
+
 void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
 {
     const auto K = base::parseNumber<std::uint32_t>(text);
-    const auto& sizes = rules::blockSizes;
-    if (!K || *K < sizes.front().K || *K > sizes.back().K) {
-        refuse("--block-size", text, "allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
-    }
-    if (rules::findBlockSize(*K) == nullptr) {
-        std::size_t above = 0;
-        while (sizes[above].K < *K) {
-            ++above;
-        }
-        refuse("--block-size",
-               text,
-               "the nearest block sizes of 3GPP TS 36.212 are " + std::to_string(sizes[above - 1].K) + " and " +
-                   std::to_string(sizes[above].K));
+    if (!K || rules::findBlockSize(*K) == nullptr) {
+        refuse("--block-size", text, blockSizesNear(K.value_or(0)));
     }
     values.push_back(*K);
 }

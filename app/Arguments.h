@@ -31,6 +31,9 @@ std::vector<std::string> offered(CLI::Option& option);
 /// Throws CLI::ValidationError: `text` is not allowed for the option; `allowed` says what is.
 [[noreturn]] void refuse(const std::string& option, const std::string& text, const std::string& allowed);
 
+/// The block sizes next to a K that is none: "the nearest block sizes of 3GPP TS 36.212 are 40 and 48".
+std::string blockSizesNear(std::uint32_t K);
+
 /// Parses a block size and appends it. Otherwise refuses the text for --block-size and names the nearest sizes.
 void appendBlockSize(const std::string& text, std::vector<unsigned>& values);
 

@@ -1,7 +1,6 @@
 // Info: the subcommand that shows how the core handles a block size.
 #include "Info.h"
 
-#include <algorithm>
 #include <cstdint>
 #include <cstdio>
 #include <memory>
@@ -195,17 +194,6 @@ std::string generalInformation(const Options& options)
     return object.dump(2) + '\n';
 }
 
-/// The sizes next to a K that is not a block size.
-std::string neighbours(std::uint32_t K)
-{
-    const auto* const above = std::find_if(
-        rules::blockSizes.begin(), rules::blockSizes.end(), [K](const rules::BlockSize& size) { return size.K > K; });
-    if (above == rules::blockSizes.begin() || above == rules::blockSizes.end()) {
-        return "they go from 40 to 6144";
-    }
-    return "the nearest ones are " + std::to_string((above - 1)->K) + " and " + std::to_string(above->K);
-}
-
 std::string information(const Options& options)
 {
     if (!options.K) {
@@ -215,8 +203,7 @@ std::string information(const Options& options)
         return generalInformation(options);
     }
     if (rules::findBlockSize(*options.K) == nullptr) {
-        throw std::invalid_argument(std::to_string(*options.K) +
-                                    " is no block size of 3GPP TS 36.212: " + neighbours(*options.K));
+        throw std::invalid_argument(std::to_string(*options.K) + " is no block size, " + blockSizesNear(*options.K));
     }
     const BlockLayout layout = layoutOf(*options.K);
     if (!options.plot.empty()) {
