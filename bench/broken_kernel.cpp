@@ -12,10 +12,21 @@ extern "C" decltype(veltra_ip_morvik_v1_0_set_instruction_set) __real_veltra_ip_
 extern "C" decltype(veltra_ip_morvik_v1_0_set_instruction_set) __wrap_veltra_ip_morvik_v1_0_set_instruction_set;
 extern "C" decltype(veltra_ip_morvik_v1_0_batch_simulate_i32) __real_veltra_ip_morvik_v1_0_batch_simulate_i32;
 extern "C" decltype(veltra_ip_morvik_v1_0_batch_simulate_i32) __wrap_veltra_ip_morvik_v1_0_batch_simulate_i32;
+extern "C" decltype(veltra_ip_morvik_v1_0_batch_simulate_i8) __real_veltra_ip_morvik_v1_0_batch_simulate_i8;
+extern "C" decltype(veltra_ip_morvik_v1_0_batch_simulate_i8) __wrap_veltra_ip_morvik_v1_0_batch_simulate_i8;
 
 namespace {
 
 const veltra_ip_morvik_v1_0_state* soundState = nullptr;
+
+void breakOneBit(std::int32_t status,
+                 const veltra_ip_morvik_v1_0_state* state,
+                 const veltra_ip_morvik_v1_0_batch_outputs& outputs)
+{
+    if (status == 0 && state != soundState) {
+        outputs.dout[33] ^= 1;
+    }
+}
 
 }  // namespace
 
@@ -39,9 +50,23 @@ std::int32_t __wrap_veltra_ip_morvik_v1_0_batch_simulate_i32(veltra_ip_morvik_v1
 {
     const std::int32_t status = __real_veltra_ip_morvik_v1_0_batch_simulate_i32(
         state, rsc1_sys, rsc1_par, rsc2_par, din_size, blocks, iterations, tags, outputs);
-    if (status == 0 && state != soundState) {
-        outputs->dout[33] ^= 1;
-    }
+    breakOneBit(status, state, *outputs);
+    return status;
+}
+
+std::int32_t __wrap_veltra_ip_morvik_v1_0_batch_simulate_i8(veltra_ip_morvik_v1_0_state* state,
+                                                            const std::int8_t* rsc1_sys,
+                                                            const std::int8_t* rsc1_par,
+                                                            const std::int8_t* rsc2_par,
+                                                            std::int32_t din_size,
+                                                            std::uint32_t blocks,
+                                                            std::uint32_t iterations,
+                                                            const std::uint32_t* tags,
+                                                            veltra_ip_morvik_v1_0_batch_outputs* outputs)
+{
+    const std::int32_t status = __real_veltra_ip_morvik_v1_0_batch_simulate_i8(
+        state, rsc1_sys, rsc1_par, rsc2_par, din_size, blocks, iterations, tags, outputs);
+    breakOneBit(status, state, *outputs);
     return status;
 }
 // NOLINTEND(bugprone-reserved-identifier)

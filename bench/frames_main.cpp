@@ -2,6 +2,8 @@
 #include <CLI/CLI.hpp>
 #include <iomanip>
 #include <iostream>
+#include <stdexcept>
+#include <string>
 #include <vector>
 
 #include "Measure.h"
@@ -19,6 +21,8 @@ using namespace morvik::link;
 constexpr int milliDecibels = 1000;
 constexpr double scale = 8;
 constexpr std::uint64_t seed = 1;
+constexpr int units = 4;
+constexpr int algorithm = 1;
 
 /// Frames of one size, made and decoded `count` at a time, in separate stages or as a whole.
 class Stages {
@@ -29,14 +33,17 @@ public:
           itsEncoder(K),
           itsSampler(roundedDistribution(noiseDeviation(K, milliDecibels), scale), randomKey(seed), form),
           itsSource(K, milliDecibels, scale, seed, Noise::discrete, form),
-          itsDecoder(4, 1)
+          itsDecoder(units, algorithm)
     {
         // The decoder's instruction sets have the same names.
-        veltra_ip_morvik_v1_0_set_instruction_set(itsDecoder.state(), form.name);
+        if (veltra_ip_morvik_v1_0_set_instruction_set(itsDecoder.state(), form.name) != 0) {
+            throw std::runtime_error(std::string("no such decoder: ") + form.name);
+        }
         itsInformation.words = itsEncoder.words();
         itsInformation.bits.resize(count * itsInformation.words);
         encode();
         make();
+        checkDecisions(form.name);
     }
 
     void encode()
@@ -70,19 +77,7 @@ public:
 
     void decode()
     {
-        itsDecisions.resize(itsFrames.sent.size());
-        veltra_ip_morvik_v1_0_batch_outputs outputs = {};
-        outputs.dout = itsDecisions.data();
-        outputs.dout_alloc = itsDecisions.size();
-        veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.state(),
-                                                itsFrames.streams[0].data(),
-                                                itsFrames.streams[1].data(),
-                                                itsFrames.streams[2].data(),
-                                                static_cast<std::int32_t>(itsK + morvik::rules::tailPositions),
-                                                itsCount,
-                                                morvik::bench::iterations,
-                                                nullptr,
-                                                &outputs);
+        decodeBy(itsDecoder);
     }
 
     /// Cycles per information bit, the median of the repetitions.
@@ -103,6 +98,41 @@ public:
     }
 
 private:
+    /// The components define the decisions.
+    void checkDecisions(const std::string& instructionSet)
+    {
+        morvik::blocks::Decoder components(units, algorithm);
+        components.decodeByComponents();
+        decodeBy(components);
+        const std::vector<std::uint8_t> expected = itsDecisions;
+        decode();
+        if (itsDecisions != expected) {
+            throw std::runtime_error("K=" + std::to_string(itsK) + '/' + instructionSet +
+                                     ": decodes to other bits than the components");
+        }
+    }
+
+    void decodeBy(const morvik::blocks::Decoder& decoder)
+    {
+        itsDecisions.resize(itsFrames.sent.size());
+        veltra_ip_morvik_v1_0_batch_outputs outputs = {};
+        outputs.dout = itsDecisions.data();
+        outputs.dout_alloc = itsDecisions.size();
+        const std::int32_t status =
+            veltra_ip_morvik_v1_0_batch_simulate_i8(decoder.state(),
+                                                    itsFrames.streams[0].data(),
+                                                    itsFrames.streams[1].data(),
+                                                    itsFrames.streams[2].data(),
+                                                    static_cast<std::int32_t>(itsK + morvik::rules::tailPositions),
+                                                    itsCount,
+                                                    morvik::bench::iterations,
+                                                    nullptr,
+                                                    &outputs);
+        if (status != 0) {
+            throw std::runtime_error("status " + std::to_string(status));
+        }
+    }
+
     unsigned itsK;
     unsigned itsCount;
     TurboEncoder itsEncoder;
@@ -118,8 +148,8 @@ private:
 void measure(const morvik::bench::Options& options)
 {
     std::cout
-        << "Making frames, and decoding them with 4 units, type 1, " << morvik::bench::iterations
-        << " iterations: cycles for an information bit\n\n"
+        << "Making frames, and decoding them with " << units << " units, type " << algorithm << ", "
+        << morvik::bench::iterations << " iterations: cycles for an information bit\n\n"
         << "|    K | frames a call | instructions | encode | soft values | make, in all | decode | make / decode |\n"
         << "|-----:|--------------:|--------------|-------:|------------:|-------------:|-------:|--------------:|\n"
         << std::fixed << std::setprecision(2);
@@ -151,6 +181,11 @@ int main(int argc, char** argv)
         ->check(CLI::Range(1U, 1000U));
     app.add_option("--seconds", options.seconds, "That a repetition takes at least")->check(CLI::Range(0.0, 100.0));
     CLI11_PARSE(app, argc, argv);
-    measure(options);
+    try {
+        measure(options);
+    } catch (const std::exception& error) {
+        std::cerr << "morvik_bench_frames: " << error.what() << '\n';
+        return 1;
+    }
     return 0;
 }

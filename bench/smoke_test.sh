@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Runs the short lines of the benchmarks for a moment: they must succeed, which includes that the decoders
 # decided rightly, and print whole tables.
-#   smoke_test.sh MORVIK_BENCH MORVIK_BENCH_FRAMES MORVIK_BENCH_BROKEN
+#   smoke_test.sh MORVIK_BENCH MORVIK_BENCH_FRAMES MORVIK_BENCH_BROKEN MORVIK_BENCH_FRAMES_BROKEN
 set -euo pipefail
 json=$(mktemp)
 trap 'rm -f "$json"' EXIT
@@ -44,6 +44,10 @@ for filter in '^K=40/batch' 'compare/K=512/batch'; do
     fi
     expect 1 'message on a wrong bit' '^morvik_bench: .*/batch/.*: decodes to other bits than the components$'
 done
+if output=$("$4" --repetitions 1 --seconds 0 2>&1); then
+    fail 'a wrong bit of frames is not noticed'
+fi
+expect 1 'message on a wrong bit' '^morvik_bench_frames: K=6144/.*: decodes to other bits than the components$'
 
 output=$("$2" --repetitions 1 --seconds 0)
 expect 1 'table of frames' '^\| +K \| frames a call \| instructions \|.*\| make / decode \|$'
