@@ -50,6 +50,7 @@ public:
         : itsFile(input, name), itsMap(map), itsDump(dump), itsScopes(map)
     {
         dump.waveform.emplace(dump.lines.size());
+        itsReals.numbers = NumberForm::real;
     }
 
     void read()
@@ -77,13 +78,16 @@ private:
     /// More than any design has: guards against endless dumps.
     static constexpr unsigned mostNets = 1U << 23;
 
-    /// The most words in a row without a variable or a change, such as comments and times at which nothing changes.
+    /// The most words in a row that bring neither a variable nor the first change at a new time: comments, times at
+    /// which nothing changes, and changes at one time, where each identifier may have two vectors.
     static constexpr unsigned mostIdle = 4000000;
+    static constexpr unsigned wordsOfChanges = 4;
 
     bool nextWord()
     {
-        if (++itsIdle > mostIdle) {
-            itsFile.fail("more than " + std::to_string(mostIdle) + " words without a change of a value");
+        const std::size_t most = mostIdle + wordsOfChanges * itsNets.size();
+        if (++itsIdle > most) {
+            itsFile.fail("more than " + std::to_string(most) + " words without a change at a new time");
         }
         while (true) {
             itsRest.remove_prefix(std::min(itsRest.find_first_not_of(" \t"), itsRest.size()));
@@ -257,7 +261,10 @@ private:
 
     void readChange()
     {
-        itsIdle = 0;
+        if (itsTime != itsTimeOfChange) {
+            itsTimeOfChange = itsTime;
+            itsIdle = 0;
+        }
         endDeclarations();
         std::string_view digits = itsWord;
         std::string_view identifier;
@@ -301,13 +308,11 @@ private:
 
     std::int64_t realValue(const VcdVariable& variable, std::string_view digits) const
     {
-        NameMap reals;
-        reals.numbers = NumberForm::real;
         const bool inEighths = variable.role == Role::signal;
-        const auto value = reals.number(digits, variable.signal);
+        const auto value = itsReals.number(digits, variable.signal);
         if (!value || (!inEighths && *value % 8 != 0)) {
             itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected " +
-                         (inEighths ? reals.expectedNumber(variable.signal) : "an integer"));
+                         (inEighths ? itsReals.expectedNumber(variable.signal) : "an integer"));
         }
         return inEighths ? *value : *value / 8;
     }
@@ -400,13 +405,15 @@ private:
 
     DumpFile itsFile;
     const NameMap& itsMap;
+    NameMap itsReals;  // to read real values by
     Dump& itsDump;
     VcdScopes itsScopes;
     std::string_view itsRest;
     std::string_view itsWord;
-    unsigned itsIdle = 0;  // words since the last variable or change
+    std::size_t itsIdle = 0;  // words since the last variable or the first change at the last time
     Timescale itsTimescale;
-    std::uint64_t itsTime = 0;  // in the timescale's unit
+    std::uint64_t itsTime = 0;                     // in the timescale's unit
+    std::optional<std::uint64_t> itsTimeOfChange;  // of the last change
     bool itsIsDeclared = false;
     std::map<std::string, unsigned, std::less<>> itsNets;  // by identifier
     std::vector<std::vector<unsigned>> itsOfNet;           // variables to read

@@ -5,7 +5,9 @@
 #include <gtest/gtest.h>
 
 #include <sstream>
+#include <streambuf>
 #include <string>
+#include <utility>
 
 #include "base/Error.h"
 #include "hardware/comparison/Dump.h"
@@ -33,6 +35,43 @@ inline void expectRefused(Reader reader, const std::string& text, const std::str
 {
     try {
         read(reader, text, map);
+        FAIL() << "accepted";
+    } catch (const base::Error& error) {
+        EXPECT_EQ(error.what(), message);
+    }
+}
+
+/// Gives a text once, and another over and over.
+class Endless : public std::streambuf {
+public:
+    explicit Endless(std::string repeated, std::string first = "")
+        : itsText(std::move(first)), itsRepeated(std::move(repeated))
+    {
+        setg(itsText.data(), itsText.data(), itsText.data() + itsText.size());
+    }
+
+protected:
+    int_type underflow() override
+    {
+        setg(itsRepeated.data(), itsRepeated.data(), itsRepeated.data() + itsRepeated.size());
+        return traits_type::to_int_type(itsRepeated.front());
+    }
+
+private:
+    std::string itsText;
+    std::string itsRepeated;
+};
+
+inline void expectEndlessRefused(Reader reader,
+                                 const std::string& repeated,
+                                 const std::string& message,
+                                 const std::string& first = "")
+{
+    Endless content(repeated, first);
+    std::istream input(&content);
+    Dump dump(2, 43);
+    try {
+        reader(input, "dump", {}, dump);
         FAIL() << "accepted";
     } catch (const base::Error& error) {
         EXPECT_EQ(error.what(), message);
