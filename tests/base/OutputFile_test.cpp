@@ -7,7 +7,11 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <cerrno>
+#include <cstdarg>
 #include <filesystem>
+#include <string>
 
 #include "base/Error.h"
 #include "support/SmallFiles.h"
@@ -56,6 +60,21 @@ std::vector<std::string> everythingIn(const morvik::support::TemporaryFolder& fo
         names.push_back(entry.path().filename());
     }
     return names;
+}
+
+/// Whether files can be opened without a name, as on most file systems of Linux, but not on NFS.
+bool unnamedFilesExist = true;
+
+/// Opens by the given function, which takes a mode where the flags make a file.
+template <class Open>
+int openIfSupported(Open open, const char* path, int flags, va_list modes)
+{
+    const bool isUnnamed = (flags & O_TMPFILE) == O_TMPFILE;
+    if (isUnnamed && !unnamedFilesExist) {
+        errno = EOPNOTSUPP;
+        return -1;
+    }
+    return isUnnamed || (flags & O_CREAT) != 0 ? open(path, flags, va_arg(modes, mode_t)) : open(path, flags);
 }
 
 class OutputFile : public testing::Test {
@@ -293,4 +312,104 @@ TEST_F(OutputFile, IsCheckedForAFolderAndAPlaceThatIsNoFile)
     EXPECT_THROW(checkWritable(file), Error);
 }
 
+/// As on a file system without unnamed files.
+class NamedOutputFile : public OutputFile {
+protected:
+    NamedOutputFile()
+    {
+        unnamedFilesExist = false;
+    }
+
+    ~NamedOutputFile() override
+    {
+        unnamedFilesExist = true;
+    }
+
+    /// The names that a file takes until it is complete, in the order of their numbers.
+    std::string temporaryName(unsigned number) const
+    {
+        return ".morvik-" + std::to_string(getpid()) + '-' + std::to_string(number);
+    }
+
+    /// The number of the next file's name.
+    unsigned nextNumber() const
+    {
+        const morvik::base::OutputFile probe(folder.path("probe"));
+        const Names names = everythingIn(folder);
+        const std::string& name = *std::find_if(
+            names.begin(), names.end(), [](const std::string& each) { return each.rfind(".morvik-", 0) == 0; });
+        return static_cast<unsigned>(std::stoul(name.substr(name.rfind('-') + 1))) + 1;
+    }
+};
+
+TEST_F(NamedOutputFile, ReplacesAnotherWhenItIsComplete)
+{
+    folder.write("file.csv", "old\n");
+    ASSERT_EQ(chmod(file.c_str(), 0640), 0);
+    {
+        morvik::base::OutputFile output(file);
+        output.write("new\n");
+        EXPECT_EQ(everythingIn(folder).size(), 2U);
+        EXPECT_EQ(folder.read("file.csv"), "old\n");
+        output.commit();
+    }
+    EXPECT_EQ(folder.read("file.csv"), "new\n");
+    struct stat status = {};
+    ASSERT_EQ(stat(file.c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 0777, 0640U);
+    EXPECT_EQ(everythingIn(folder), Names{"file.csv"});
+}
+
+TEST_F(NamedOutputFile, VanishesWhenItIsGivenUp)
+{
+    {
+        morvik::base::OutputFile output(file);
+        output.write("lost\n");
+        morvik::base::OutputFile moved(std::move(output));
+        EXPECT_EQ(everythingIn(folder).size(), 1U);
+    }
+    EXPECT_EQ(everythingIn(folder), Names{});
+    checkWritable(file);
+    EXPECT_EQ(everythingIn(folder), Names{});
+}
+
+TEST_F(NamedOutputFile, LeavesNamesThatAreTaken)
+{
+    const unsigned next = nextNumber();
+    folder.write(temporaryName(next), "of another machine\n");
+    folder.write(temporaryName(next + 1), "left by a crash\n");
+    writeFile(file, "new\n");
+    EXPECT_EQ(folder.read("file.csv"), "new\n");
+    EXPECT_EQ(folder.read(temporaryName(next)), "of another machine\n");
+    EXPECT_EQ(folder.read(temporaryName(next + 1)), "left by a crash\n");
+    EXPECT_EQ(everythingIn(folder).size(), 3U);
+}
+
 }  // namespace
+
+// Of each pair, the linker puts the second in the place of the system's function, which becomes the first. The names
+// are its own. 32-bit programs open files by open64. NOLINTBEGIN(bugprone-reserved-identifier)
+extern "C" int __real_open(const char* path, int flags, ...);
+extern "C" int __wrap_open(const char* path, int flags, ...);
+
+int __wrap_open(const char* path, int flags, ...)
+{
+    va_list modes;
+    va_start(modes, flags);
+    const int file = openIfSupported(__real_open, path, flags, modes);
+    va_end(modes);
+    return file;
+}
+
+extern "C" int __real_open64(const char* path, int flags, ...);
+extern "C" int __wrap_open64(const char* path, int flags, ...);
+
+int __wrap_open64(const char* path, int flags, ...)
+{
+    va_list modes;
+    va_start(modes, flags);
+    const int file = openIfSupported(__real_open64, path, flags, modes);
+    va_end(modes);
+    return file;
+}
+// NOLINTEND(bugprone-reserved-identifier)
