@@ -31,8 +31,7 @@ protected:
     Process start(const Arguments& arguments) const
     {
         const int silent = open("/dev/null", O_RDWR | O_CLOEXEC);
-        const int messages =
-            open((morvik.directory() + "/messages").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+        const int messages = create("messages");
         const int streams[] = {silent, silent, messages};
         Process process(
             morvik.program(),
@@ -45,18 +44,29 @@ protected:
         return process;
     }
 
-    /// Waits until the checkpoint holds a text; false after a minute.
-    bool waitForCheckpoint(const std::string& text) const
+    /// An empty file for a stream of a process.
+    int create(const std::string& file) const
+    {
+        return open((morvik.directory() + '/' + file).c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    }
+
+    /// Waits until a file holds a text; false after a minute.
+    bool waitFor(const std::string& file, const std::string& text) const
     {
         for (int i = 0; i < 6000; ++i) {
-            std::ifstream file(morvik.directory() + "/results.csv.checkpoint");
-            const std::string content(std::istreambuf_iterator<char>(file), {});
+            std::ifstream stream(morvik.directory() + '/' + file);
+            const std::string content(std::istreambuf_iterator<char>(stream), {});
             if (content.find(text) != std::string::npos) {
                 return true;
             }
             std::this_thread::sleep_for(std::chrono::milliseconds(10));
         }
         return false;
+    }
+
+    bool waitForCheckpoint(const std::string& text) const
+    {
+        return waitFor("results.csv.checkpoint", text);
     }
 
     /// Resumes the run of results.csv to its end, and returns that without times.
@@ -197,20 +207,18 @@ TEST_F(BerRuns, ThatIgnoreSignalsGoOnIgnoringThem)
 
 TEST_F(BerRuns, WithoutAnOutputEndBySignalsToo)
 {
-    const CommandRunner shell("/bin/sh");
-    const CommandResult result = shell.run({"-c",
-                                            "\"$@\" & sleep 0.3; kill -TERM $!; wait $!",
-                                            "sh",
-                                            morvik.program(),
-                                            "ber",
-                                            "--block-size",
-                                            "40",
-                                            "--ebn0",
-                                            "50",
-                                            "--max-blocks",
-                                            "1000000000000"});
-    EXPECT_EQ(result.status, 128 + SIGTERM);
-    EXPECT_EQ(result.err, "morvik ber: interrupted\n");
+    const Arguments endless = words("ber --block-size 40 --ebn0 0,50 --block-errors 10 --max-blocks 1000000000000");
+    const int silent = open("/dev/null", O_RDONLY | O_CLOEXEC);
+    const int table = create("table");
+    const int messages = create("messages");
+    Process process(morvik.program(), endless, morvik.directory(), {silent, table, messages});
+    for (const int stream : {silent, table, messages}) {
+        close(stream);
+    }
+    EXPECT_TRUE(waitFor("table", "\n    0      0 ")) << "the first point has not ended";
+    process.send(SIGTERM);
+    EXPECT_EQ(process.wait(), 128 + SIGTERM);
+    EXPECT_EQ(morvik.read("messages"), "morvik ber: interrupted\n");
 }
 
 TEST_F(BerRuns, ThatFillTheDiskLoseNothing)

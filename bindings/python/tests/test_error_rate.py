@@ -4,6 +4,7 @@ import csv
 import os
 import signal
 import threading
+import time
 
 import matplotlib
 import morvik
@@ -129,8 +130,18 @@ def test_progress_may_end_the_simulation():
 
 
 def test_an_interrupt_ends_the_simulation():
-    threading.Timer(0.3, os.kill, (os.getpid(), signal.SIGINT)).start()
+    def tasks():
+        return len(os.listdir("/proc/self/task"))
+
+    def interrupt():
+        while tasks() < both + 2:  # the simulation's threads
+            time.sleep(0.001)
+        os.kill(os.getpid(), signal.SIGINT)
+
+    interrupter = threading.Thread(target=interrupt)
+    both = tasks() + 1
     with pytest.raises(KeyboardInterrupt):
+        interrupter.start()
         morvik.error_rate(6144, 0.0, block_errors=2**63 - 1, max_blocks=2**63 - 1, threads=2)
 
 
