@@ -21,7 +21,7 @@ BELOW = {
     "link": "link/channel link/coding link/modulation link/random rules",
     "simulation": "base link link/channel rules",
     "report": "base simulation rules",
-    "hardware/testbench": "src rules",
+    "hardware/testbench": "base rules src",
     "hardware/tables": "base",
     "hardware/vectors": "base hardware/tables hardware/testbench link link/channel rules",
     "hardware/trace": "base hardware/tables hardware/testbench rules",
