@@ -115,8 +115,6 @@ void TransportBlockCode::encode(const PackedBlocks& information,
     }
 }
 
-/// Code block r before the encoder: filler bits, its part of the transport block and of its CRC, its own CRC. `block`
-/// is all zeros before.
 void TransportBlockCode::frame(const std::uint64_t* row, unsigned r, std::uint64_t* block) const
 {
     const std::size_t first = itsPayloadOffsets[r];
@@ -146,10 +144,14 @@ void TransportBlockCode::select(const PackedBlocks& buffers,
     coded.words = wordsOf(itsFormat.codedBits);
     coded.bits.assign(count * coded.words, 0);
     for (unsigned b = 0; b < count; ++b) {
-        for (unsigned r = 0; r < itsBlocks.count; ++r) {
-            matching(r).select(
-                buffers.block(b) + itsWordOffsets[r], version, codedBits(r), coded.block(b), codedOffset(r));
-        }
+        select(buffers.block(b), version, coded.block(b));
+    }
+}
+
+void TransportBlockCode::select(const std::uint64_t* buffers, unsigned version, std::uint64_t* coded) const
+{
+    for (unsigned r = 0; r < itsBlocks.count; ++r) {
+        matching(r).select(buffers + itsWordOffsets[r], version, codedBits(r), coded, codedOffset(r));
     }
 }
 

@@ -72,6 +72,13 @@ public:
     /// The coded bits of one transmission of each transport block.
     void select(const PackedBlocks& buffers, unsigned count, unsigned version, PackedBlocks& coded) const;
 
+    /// The same of one transport block. `coded` is all zeros before.
+    void select(const std::uint64_t* buffers, unsigned version, std::uint64_t* coded) const;
+
+    /// Code block r of a packed transport block before the encoder: filler bits, its part of the transport block and of
+    /// its CRC, its own CRC. `block` is all zeros before.
+    void frame(const std::uint64_t* row, unsigned r, std::uint64_t* block) const;
+
     /// Values of a soft buffer; that of code block r starts at softOffset(r).
     std::size_t softSize() const
     {
@@ -104,7 +111,6 @@ private:
 
     void layOut();
     void encode(const PackedBlocks& information, const std::vector<Place>& places, PackedBlocks& buffers);
-    void frame(const std::uint64_t* row, unsigned r, std::uint64_t* block) const;
 
     TransportFormat itsFormat;
     CodeBlocks itsBlocks;

@@ -22,6 +22,17 @@ RandomKey randomKey(std::uint64_t seed)
     return {lowWord(seed), highWord(seed)};
 }
 
+RandomKey derivedKey(const RandomKey& key, std::uint64_t low, std::uint64_t high)
+{
+    const RandomBlock block = randomBlock(key, low, high);
+    return {block[0], block[1]};
+}
+
+FrameRandom::FrameRandom(const RandomKey& key, std::uint32_t part, std::uint64_t frame)
+    : itsKey(key), itsLow(frame << 32), itsHigh(std::uint64_t{part} << 32 | frame >> 32)
+{
+}
+
 FrameRandom::FrameRandom(const RandomKey& key, unsigned K, int milliDecibels, std::uint64_t frame)
     : itsKey(key),
       itsLow(frame << 32),

@@ -31,11 +31,17 @@ inline RandomBlock randomBlock(const RandomKey& key, std::uint64_t counterLow, s
 
 RandomKey randomKey(std::uint64_t seed);
 
+/// A key for what the words name, different for each seed.
+RandomKey derivedKey(const RandomKey& key, std::uint64_t low, std::uint64_t high);
+
 /// The random numbers of a frame. Word 0 of the counter is the index, the others name the frame and its point.
 class FrameRandom {
 public:
     /// `K` below 8192; `milliDecibels`, the Eb/N0 in thousandths of a decibel, from -262144 to 262143.
     FrameRandom(const RandomKey& key, unsigned K, int milliDecibels, std::uint64_t frame);
+
+    /// Of a key that names the point. `part` tells the transmissions of a frame apart.
+    FrameRandom(const RandomKey& key, std::uint32_t part, std::uint64_t frame);
 
     RandomBlock block(std::uint32_t index) const
     {
@@ -65,6 +71,7 @@ constexpr std::uint32_t information = 0;         ///< one per 128 information bi
 constexpr std::uint32_t softValues = 1U << 24;   ///< one per eight soft values
 constexpr std::uint32_t refinements = 2U << 24;  ///< one per soft value, seldom needed
 constexpr std::uint32_t gaussian = 3U << 24;     ///< one per Gaussian number
+constexpr std::uint32_t fineNoise = 4U << 24;    ///< one per eight numbers of noise
 
 }  // namespace random_index
 

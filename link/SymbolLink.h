@@ -1,0 +1,48 @@
+// SymbolLink: from coded bits over mapper, channel and demapper to log-likelihood ratios.
+#ifndef MORVIK_LINK_SYMBOLLINK_H
+#define MORVIK_LINK_SYMBOLLINK_H
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "link/channel/FadingChannel.h"
+#include "link/modulation/Demapper.h"
+#include "link/modulation/Modulation.h"
+
+namespace morvik::link {
+
+/// How coded bits are sent and received.
+struct SymbolFormat {
+    Modulation modulation = Modulation::bpsk;
+    Fading fading = Fading::none;
+    Demapper demapper = Demapper::maxLog;
+    int milliDecibels = 0;  ///< Es/N0 in thousandths of a decibel
+};
+
+/// What tells the random numbers of points with different formats apart. The receiver's choices do not.
+std::uint64_t keyWordOf(const SymbolFormat& format);
+
+/// How many ratios, times scale, lie outside what soft values can be.
+std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale);
+
+class SymbolLink {
+public:
+    /// Throws std::invalid_argument for an Es/N0 that FadingChannel refuses.
+    SymbolLink(const SymbolFormat& format, const RandomKey& key, const SamplerForm& form);
+
+    /// The ratios ln(P(1) / P(0)) of `count` packed bits, a multiple of the modulation's, that a frame sends in one
+    /// transmission.
+    void receive(
+        std::uint64_t frame, unsigned transmission, const std::uint64_t* bits, std::size_t count, float* ratios);
+
+private:
+    SymbolFormat itsFormat;
+    FadingChannel itsChannel;
+    std::vector<float> itsSymbols;
+    std::vector<float> itsGains;
+};
+
+}  // namespace morvik::link
+
+#endif

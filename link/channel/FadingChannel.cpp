@@ -1,0 +1,90 @@
+// FadingChannel: white Gaussian noise and Rayleigh fading on symbols, the same on every machine.
+#include "FadingChannel.h"
+
+#include <algorithm>
+#include <cmath>
+#include <stdexcept>
+#include <string>
+
+#include "Decibels.h"
+
+namespace morvik::link {
+
+namespace {
+
+constexpr std::array<std::string_view, fadings.size()> names = {"awgn", "rayleigh", "block-rayleigh"};
+
+int checked(int milliDecibels)
+{
+    if (milliDecibels < -mostMilliDecibels || milliDecibels > mostMilliDecibels) {
+        throw std::invalid_argument("an Es/N0 of " + std::to_string(milliDecibels) + " thousandths of a decibel");
+    }
+    return milliDecibels;
+}
+
+/// The amplitude of a complex Gaussian number of mean energy 1. The sum of the squares fits in 31 bits.
+float amplitude(std::int32_t real, std::int32_t imaginary)
+{
+    static_assert(std::int64_t{2} * mostNoise * mostNoise <= INT32_MAX);
+    constexpr auto unit = static_cast<float>(1 / (2 * noiseSteps * noiseSteps));
+    return std::sqrt(static_cast<float>(real * real + imaginary * imaginary) * unit);
+}
+
+}  // namespace
+
+std::string_view nameOf(Fading fading)
+{
+    return names[static_cast<unsigned>(fading)];
+}
+
+std::optional<Fading> fadingOf(std::string_view name)
+{
+    const auto found = std::find(names.begin(), names.end(), name);
+    return found == names.end() ? std::nullopt
+                                : std::optional(fadings[static_cast<std::size_t>(found - names.begin())]);
+}
+
+FadingChannel::FadingChannel(
+    Fading fading, unsigned dimensions, int milliDecibels, const RandomKey& key, const SamplerForm& form)
+    : itsFading(fading),
+      itsDimensions(dimensions),
+      itsKey(key),
+      itsNoiseVariance(static_cast<float>(ratioOf(-checked(milliDecibels)))),
+      itsNoiseStep(static_cast<float>(std::sqrt(ratioOf(-milliDecibels) / 2) / noiseSteps)),
+      itsSampler(key, form)
+{
+}
+
+void FadingChannel::pass(
+    std::uint64_t frame, unsigned transmission, std::uint32_t first, std::uint32_t count, float* symbols, float* gains)
+{
+    itsNumbers.resize(std::size_t{2} * count);
+    if (hasGains()) {
+        drawGains(FrameRandom(itsKey, 2 * transmission + 1, frame), first, count, gains);
+        for (std::size_t i = 0; i < count; ++i) {
+            for (unsigned d = 0; d < itsDimensions; ++d) {
+                symbols[i * itsDimensions + d] *= gains[i];
+            }
+        }
+    }
+    const std::uint32_t numbers = itsDimensions * count;
+    itsSampler.draw(FrameRandom(itsKey, 2 * transmission, frame), itsDimensions * first, numbers, itsNumbers.data());
+    for (std::uint32_t i = 0; i < numbers; ++i) {
+        symbols[i] += static_cast<float>(itsNumbers[i]) * itsNoiseStep;
+    }
+}
+
+void FadingChannel::drawGains(const FrameRandom& random, std::uint32_t first, std::uint32_t count, float* gains)
+{
+    if (itsFading == Fading::constant) {
+        itsSampler.draw(random, 0, 2, itsNumbers.data());
+        std::fill_n(gains, count, amplitude(itsNumbers[0], itsNumbers[1]));
+        return;
+    }
+    itsSampler.draw(random, 2 * first, 2 * count, itsNumbers.data());
+    for (std::size_t i = 0; i < count; ++i) {
+        gains[i] = amplitude(itsNumbers[2 * i], itsNumbers[2 * i + 1]);
+    }
+}
+
+}  // namespace morvik::link

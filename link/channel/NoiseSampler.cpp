@@ -1,0 +1,88 @@
+// NoiseSampler: Gaussian noise in integers, the same on every machine.
+#include "NoiseSampler.h"
+
+#include <algorithm>
+#include <array>
+
+namespace morvik::link {
+
+namespace {
+
+constexpr int mostSteps = 126;
+
+/// Numbers that are drawn together: few enough to stay in the first-level cache.
+constexpr std::uint32_t partSize = 4096;
+
+constexpr std::array<std::uint64_t, 64> allOnes()
+{
+    std::array<std::uint64_t, partSize / 64> words{};
+    for (std::uint64_t& word : words) {
+        word = ~std::uint64_t{0};
+    }
+    return words;
+}
+
+}  // namespace
+
+RoundedDistribution coarseNoise()
+{
+    // exp(-d^2 / 2 s^2) for s = 18: each is the one before times r^(2 d - 1) with r = exp(-1 / 2 s^2).
+    constexpr double r = 0.99845798025952968374;
+    std::array<double, mostSteps + 1> densities{};
+    densities[0] = 1;
+    double factor = r;
+    double sum = 1;
+    for (unsigned d = 1; d <= mostSteps; ++d) {
+        densities[d] = densities[d - 1] * factor;
+        factor *= r * r;
+        sum += 2 * densities[d];
+    }
+    RoundedDistribution distribution{};
+    constexpr std::uint64_t all = std::uint64_t{1} << AliasTable::weightBits;
+    const double unit = static_cast<double>(all) / sum;
+    std::uint64_t given = 0;
+    for (unsigned d = mostSteps; d > 0; --d) {
+        const auto weight = static_cast<std::uint64_t>(densities[d] * unit + 0.5);
+        distribution.weights[d] = weight;
+        distribution.weights[256 - d] = weight;
+        given += 2 * weight;
+    }
+    distribution.weights[0] = all - given;
+    return distribution;
+}
+
+NoiseSampler::NoiseSampler(const RandomKey& key, const SamplerForm& form)
+    : itsCoarse(coarseNoise(), key, form), itsFine(key, form), itsSteps(partSize)
+{
+}
+
+void NoiseSampler::draw(const FrameRandom& random, std::uint32_t first, std::uint32_t count, std::int16_t* numbers)
+{
+    for (std::uint32_t done = 0; done < count; done += partSize) {
+        drawPart(random, first + done, std::min(partSize, count - done), numbers + done);
+    }
+}
+
+void NoiseSampler::drawPart(const FrameRandom& random, std::uint32_t first, std::uint32_t count, std::int16_t* numbers)
+{
+    static constexpr auto ones = allOnes();
+    std::uint32_t clipped = 0;  // d does not reach the ends
+    itsCoarse.put(random, first, ones.data(), count, itsSteps.data(), clipped);
+    itsCoarse.draw();
+
+    itsFine.clear();
+    for (std::uint32_t i = 0; i < count; i += 8) {
+        itsFine.put(random.counterLow(random_index::fineNoise + (first + i) / 8), random.counterHigh());
+    }
+    itsFine.draw();
+    for (std::uint32_t i = 0; i < count; i += 8) {
+        const std::uint64_t u = itsFine.low(i / 8);
+        const std::uint64_t v = itsFine.high(i / 8);
+        for (std::uint32_t j = 0; j < std::min(8U, count - i); ++j) {
+            const auto fine = static_cast<int>((u >> 8 * j & 0xFF) + (v >> 8 * j & 0xFF));
+            numbers[i + j] = static_cast<std::int16_t>(256 * itsSteps[i + j] + fine - 255);
+        }
+    }
+}
+
+}  // namespace morvik::link
