@@ -116,12 +116,12 @@ void appendBlockSize(const std::string& text, std::vector<unsigned>& values)
     values.push_back(*K);
 }
 
-int readMilliDecibels(const std::string& text, const std::string& otherwise)
+int readMilliDecibels(const std::string& option, const std::string& text, const std::string& otherwise)
 {
     constexpr int largest = 50000;
     const auto value = base::parseThousandths(text);
     if (!value || *value < -largest || *value > largest) {
-        refuse("--ebn0", text, "allowed are -50 to 50 dB, with at most three decimals" + otherwise);
+        refuse(option, text, "allowed are -50 to 50 dB, with at most three decimals" + otherwise);
     }
     return *value;
 }

@@ -37,9 +37,9 @@ std::string blockSizesNear(std::uint32_t K);
 /// Parses a block size and appends it. Otherwise refuses the text for --block-size and names the nearest sizes.
 void appendBlockSize(const std::string& text, std::vector<unsigned>& values);
 
-/// Parses an Eb/N0 into thousandths of a decibel. Otherwise refuses the text for --ebn0; `otherwise` names what else is
-/// allowed.
-int readMilliDecibels(const std::string& text, const std::string& otherwise = "");
+/// Parses a signal-to-noise ratio into thousandths of a decibel. Otherwise refuses the text for the option; `otherwise`
+/// names what else is allowed.
+int readMilliDecibels(const std::string& option, const std::string& text, const std::string& otherwise = "");
 
 }  // namespace morvik
 

@@ -24,6 +24,17 @@ inline std::vector<std::string> splitAt(char separator, std::string_view text)
     return parts;
 }
 
+/// The texts of the values, with commas between them.
+template <class Values, class Text>
+std::string listed(const Values& values, Text textOf)
+{
+    std::string list;
+    for (const auto& value : values) {
+        list += (list.empty() ? "" : ",") + textOf(value);
+    }
+    return list;
+}
+
 /// Adds an option that takes a comma-separated list. `append` parses one element and appends its values, or throws
 /// CLI::ValidationError, as does a duplicate value. The values end up in ascending order.
 template <class Value, class Append>

@@ -163,7 +163,7 @@ void addBlockOptions(CLI::App& command, vectors::Settings& settings)
     command
         .add_option_function<std::string>(
             "--ebn0",
-            [&settings](const std::string& text) { settings.milliDecibels = readMilliDecibels(text); },
+            [&settings](const std::string& text) { settings.milliDecibels = readMilliDecibels("--ebn0", text); },
             "Eb/N0 of the random blocks in dB")
         ->type_name("X")
         ->default_str("1");

@@ -29,14 +29,34 @@ std::string checksum(std::string_view text)
     return std::string(digits - shortest.size(), '0') + shortest;
 }
 
+Json jsonOf(const Reception& reception)
+{
+    return {{"code_block_errors", reception.codeBlockErrors},
+            {"undetected_errors", reception.undetected},
+            {"transmissions", reception.transmissions},
+            {"iterations", reception.iterations}};
+}
+
+Reception receptionOf(const JsonMembers& members)
+{
+    return {members.integer("code_block_errors", 0, UINT64_MAX),
+            members.integer("undetected_errors", 0, UINT64_MAX),
+            members.integer("transmissions", 0, UINT64_MAX),
+            members.integer("iterations", 0, UINT64_MAX)};
+}
+
 Json jsonOf(const PointResult& point)
 {
     Json errors = Json::array();
     for (const ErrorCounts& counts : point.tally.errors) {
-        errors.push_back({{"bit_errors", counts.bitErrors},
-                          {"block_errors", counts.blockErrors},
-                          {"bit_error_squares", counts.bitErrorSquares},
-                          {"failures", counts.failures}});
+        Json json = {{"bit_errors", counts.bitErrors},
+                     {"block_errors", counts.blockErrors},
+                     {"bit_error_squares", counts.bitErrorSquares},
+                     {"failures", counts.failures}};
+        if (counts.reception.transmissions > 0) {
+            json["reception"] = jsonOf(counts.reception);
+        }
+        errors.push_back(json);
     }
     return {{"number", point.number},
             {"seconds", point.seconds},
@@ -45,8 +65,9 @@ Json jsonOf(const PointResult& point)
             {"errors", errors}};
 }
 
-ErrorCounts countsOf(const JsonMembers& members)
+ErrorCounts countsOf(const Json& json, const std::string& place)
 {
+    const JsonMembers members(json, place);
     ErrorCounts counts;
     counts.bitErrors = members.integer("bit_errors", 0, UINT64_MAX);
     counts.blockErrors = members.integer("block_errors", 0, UINT64_MAX);
@@ -57,6 +78,9 @@ ErrorCounts countsOf(const JsonMembers& members)
                            "allowed are " + std::to_string(ErrorCounts::keptFailures) + " numbers of frames at most");
         }
         counts.failures.push_back(frame.get<std::uint64_t>());
+    }
+    if (members.has("reception")) {
+        counts.reception = receptionOf({members.at("reception"), place + ": reception"});
     }
     return counts;
 }
@@ -74,7 +98,7 @@ PointResult pointOf(const Json& json, const std::string& place)
     point.tally.clipped = members.integer("clipped", 0, UINT64_MAX);
     point.tally.errors.clear();
     for (const Json& errors : members.list("errors")) {
-        point.tally.errors.push_back(countsOf({errors, place + ": errors"}));
+        point.tally.errors.push_back(countsOf(errors, place + ": errors"));
     }
     return point;
 }

@@ -4,11 +4,13 @@
 #include <algorithm>
 #include <charconv>
 #include <cstdint>
+#include <iterator>
 #include <optional>
 
 #include "Possible.h"
 #include "base/Numbers.h"
 #include "base/Thousandths.h"
+#include "link/coding/CodeBlocks.h"
 #include "rules/BlockSizes.h"
 
 namespace morvik::simulation {
@@ -93,6 +95,60 @@ bool skip(std::string_view, ResultRow&)
     return true;
 }
 
+/// Reads a number from 0 to `most`.
+bool readUpTo(unsigned most, std::string_view text, unsigned& value)
+{
+    return readNumber(text, value) && value <= most;
+}
+
+bool readTransportBlockSize(std::string_view text, ResultRow& row)
+{
+    return readUpTo(link::mostTransportBits, text, row.point.link.transportBlockSize);
+}
+
+bool readMcs(std::string_view text, ResultRow& row)
+{
+    row.point.link.mcs.reset();
+    const std::size_t space = text.find(' ');
+    if (space == std::string_view::npos) {
+        return text.empty();
+    }
+    const auto table = mcsTableOf(text.substr(0, space));
+    unsigned index = 0;
+    if (!table || !readNumber(text.substr(space + 1), index) || index >= countOf(*table)) {
+        return false;
+    }
+    row.point.link.mcs = {*table, index};
+    return true;
+}
+
+bool readVersions(std::string_view text, ResultRow& row)
+{
+    std::vector<unsigned>& versions = row.point.link.versions;
+    versions.clear();
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        const bool isGood = i % 2 == 0 ? text[i] >= '0' && text[i] <= '3' : text[i] == ' ' && i + 1 < text.size();
+        if (!isGood) {
+            return false;
+        }
+        if (i % 2 == 0) {
+            versions.push_back(static_cast<unsigned>(text[i] - '0'));
+        }
+    }
+    return versions.size() <= mostTransmissions;
+}
+
+bool readSoftBufferBits(std::string_view text, ResultRow& row)
+{
+    return readUpTo(16, text, row.point.link.softBufferBits) && row.point.link.softBufferBits != 1;
+}
+
+bool readAxis(std::string_view text, ResultRow& row)
+{
+    row.point.axis = text == "esn0" ? Axis::esn0 : Axis::ebn0;
+    return text == nameOf(row.point.axis);
+}
+
 using Row = ResultRow;
 using Text = std::string_view;
 constexpr auto number = Column::Kind::number;
@@ -107,6 +163,39 @@ const std::vector<Column> allColumns = {
     {"block_size", number,
      [](const Row& row) { return std::to_string(row.point.blockSize); },
      readBlockSize},
+    {"transport_block_size", number,
+     [](const Row& row) { return std::to_string(row.point.link.transportBlockSize); },
+     readTransportBlockSize, true},
+    {"code_blocks", number, [](const Row& row) { return std::to_string(codeBlocksOf(row.point)); }, skip, true},
+    {"coded_bits", number,
+     [](const Row& row) { return std::to_string(row.point.link.codedBits); },
+     [](Text field, Row& row) { return readNumber(field, row.point.link.codedBits); }, true},
+    {"mcs", text, [](const Row& row) { return mcsText(row.point.link.mcs); }, readMcs, true},
+    {"modulation", text,
+     [](const Row& row) { return std::string(nameOf(row.point.link.modulation)); },
+     [](Text field, Row& row) { return readInto(link::modulationOf(field), row.point.link.modulation); }, true},
+    {"redundancy_versions", list,
+     [](const Row& row) { return versionsText(row.point.link.versions, ' '); },
+     readVersions, true},
+    {"transmissions", number,
+     [](const Row& row) { return std::to_string(std::max<std::size_t>(row.point.link.versions.size(), 1)); },
+     skip, true},
+    {"soft_buffer_bits", number,
+     [](const Row& row) { return std::to_string(row.point.link.softBufferBits); },
+     readSoftBufferBits, true},
+    {"soft_buffer_size", number,
+     [](const Row& row) { return std::to_string(row.point.link.softBufferSize); },
+     [](Text field, Row& row) { return readNumber(field, row.point.link.softBufferSize); }, true},
+    {"channel", text,
+     [](const Row& row) { return std::string(nameOf(row.point.link.fading)); },
+     [](Text field, Row& row) { return readInto(link::fadingOf(field), row.point.link.fading); }, true},
+    {"demapper", text,
+     [](const Row& row) { return std::string(nameOf(row.point.link.demapper)); },
+     [](Text field, Row& row) { return readInto(link::demapperOf(field), row.point.link.demapper); }, true},
+    {"early_stop", text,
+     [](const Row& row) { return std::string(row.point.link.stopsEarly ? "crc" : "none"); },
+     [](Text field, Row& row) { row.point.link.stopsEarly = field == "crc"; return field == "crc" || field == "none"; },
+     true},
     {"num_pu", number,
      [](const Row& row) { return std::to_string(row.point.numPu); },
      readNumPu},
@@ -119,6 +208,10 @@ const std::vector<Column> allColumns = {
     {"iterations", number,
      [](const Row& row) { return std::to_string(row.point.iterations); },
      readIterations},
+    {"axis", text, [](const Row& row) { return std::string(nameOf(row.point.axis)); }, readAxis, true},
+    {"esn0_db", number,
+     [](const Row& row) { return base::thousandthsText(milliEsn0Of(row.point)); },
+     [](Text field, Row& row) { return readInto(base::parseThousandths(field), row.point.milliEsn0); }, true},
     {"ebn0_db", number,
      [](const Row& row) { return base::thousandthsText(row.point.milliDecibels); },
      [](Text field, Row& row) { return readInto(base::parseThousandths(field), row.point.milliDecibels); }},
@@ -146,6 +239,21 @@ const std::vector<Column> allColumns = {
     {"bler", number, [](const Row& row) { return rateText(blockErrorRate(row)); }, skip},
     {"bler_low", number, [](const Row& row) { return rateText(blockErrorBounds(row).low); }, skip},
     {"bler_high", number, [](const Row& row) { return rateText(blockErrorBounds(row).high); }, skip},
+    {"code_block_errors", number,
+     [](const Row& row) { return std::to_string(receptionOf(row).codeBlockErrors); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.reception.codeBlockErrors); }, true},
+    {"undetected_errors", number,
+     [](const Row& row) { return std::to_string(receptionOf(row).undetected); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.reception.undetected); }, true},
+    {"sent_transmissions", number,
+     [](const Row& row) { return std::to_string(receptionOf(row).transmissions); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.reception.transmissions); }, true},
+    {"run_iterations", number,
+     [](const Row& row) { return std::to_string(receptionOf(row).iterations); },
+     [](Text field, Row& row) { return readNumber(field, row.errors.reception.iterations); }, true},
+    {"mean_transmissions", number, [](const Row& row) { return rateText(meanTransmissions(row)); }, skip, true},
+    {"mean_iterations", number, [](const Row& row) { return rateText(meanIterations(row)); }, skip, true},
+    {"throughput", number, [](const Row& row) { return rateText(throughput(row)); }, skip, true},
     {"clipped_values", number,
      [](const Row& row) { return std::to_string(row.clipped); },
      [](Text field, Row& row) { return readNumber(field, row.clipped); }},
@@ -173,9 +281,30 @@ bool isVersion(std::string_view version)
     });
 }
 
-const std::vector<Column>& columns()
+const std::vector<Column>& columns(bool isWide)
 {
-    return allColumns;
+    static const std::vector<Column> narrow = [] {
+        std::vector<Column> columns;
+        std::copy_if(allColumns.begin(), allColumns.end(), std::back_inserter(columns), [](const Column& column) {
+            return !column.isWide;
+        });
+        return columns;
+    }();
+    return isWide ? allColumns : narrow;
+}
+
+bool complete(ResultRow& row)
+{
+    Point& point = row.point;
+    if (!point.link.hasTransportBlocks()) {
+        // Such rows say what follows from the others.
+        row.errors.reception = {};
+        point.milliEsn0 = point.link.isPlainBpsk() ? 0 : point.milliEsn0;
+        return point.link.codedBits == 0 && !point.link.mcs && point.link.versions.empty() && !point.link.stopsEarly;
+    }
+    const link::CodeBlocks blocks = link::codeBlocksOf(point.link.transportBlockSize);
+    return point.blockSize == blocks.sizePlus && !point.link.versions.empty() &&
+           point.link.codedBits >= blocks.count * bitsPerSymbol(point.link.modulation);
 }
 
 }  // namespace morvik::simulation

@@ -18,13 +18,18 @@ struct Column {
     Kind kind;
     std::string (*write)(const ResultRow& row);
     bool (*read)(std::string_view text, ResultRow& row);  // false if the text is not valid here
+    bool isWide = false;                                  // left out where all points are not wide
 };
 
 /// Whether the text is a valid version: short, printable, and a CSV field without quotes.
 bool isVersion(std::string_view version);
 
-/// All columns, in order. Rates and bounds are written for the reader; reading recomputes them.
-const std::vector<Column>& columns();
+/// The columns of a file, in order: of one with a wide point, or of any other. Rates and bounds are written for the
+/// reader; reading recomputes them.
+const std::vector<Column>& columns(bool isWide);
+
+/// Completes a row that has been read: what follows from its columns. False if they contradict each other.
+bool complete(ResultRow& row);
 
 }  // namespace morvik::simulation
 

@@ -2,16 +2,15 @@
 #ifndef MORVIK_SIMULATION_FRAMESIMULATOR_H
 #define MORVIK_SIMULATION_FRAMESIMULATOR_H
 
-#include <cstdint>
 #include <memory>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "Core.h"
 #include "Plan.h"
+#include "PointSimulator.h"
 #include "Workers.h"
-#include "link/FrameSource.h"
-#include "morvik_v1_0_batch.h"
 
 namespace morvik::simulation {
 
@@ -29,29 +28,17 @@ public:
     /// false if none are left.
     bool proceed(BatchResult& result);
 
-    /// The frames simulated last.
-    const morvik::link::Frames& frames() const;
+    /// The code blocks of the first of the frames that were simulated last.
+    std::vector<ReceivedBlock> receivedBlocks() const;
 
 private:
-    struct DestroyState {
-        void operator()(veltra_ip_morvik_v1_0_state* state) const
-        {
-            veltra_ip_morvik_v1_0_destroy_state(state);
-        }
-    };
-
     void prepareFor(std::size_t point);
-    void makeDecoder(const Point& point);
-    void countWrongBits(const Point& point, std::uint32_t count, std::uint32_t* wrongBits);
-    void countWrongBitsOfEachIteration(const Point& point, std::uint32_t count, std::uint32_t* wrongBits);
 
     const Plan& itsPlan;
     std::string itsInstructionSet;
     std::optional<std::size_t> itsPoint;
-    std::unique_ptr<veltra_ip_morvik_v1_0_state, DestroyState> itsDecoder;
-    std::optional<morvik::link::FrameSource> itsSource;
-    morvik::link::Frames itsFrames;
-    std::vector<std::uint8_t> itsDecided;
+    std::optional<Core> itsCore;
+    std::unique_ptr<PointSimulator> itsSimulator;
 };
 
 }  // namespace morvik::simulation

@@ -20,6 +20,14 @@ void put(std::uint64_t number, std::string& bytes)
     bytes += static_cast<char>(number);
 }
 
+void put(const Reception& reception, std::string& bytes)
+{
+    put(reception.codeBlockErrors, bytes);
+    put(reception.undetected, bytes);
+    put(reception.transmissions, bytes);
+    put(reception.iterations, bytes);
+}
+
 void putBatch(const FrameBatch& batch, std::string& bytes)
 {
     put(batch.point, bytes);
@@ -93,17 +101,22 @@ std::string packed(const BatchResult& result)
     putBatch(result.batch, bytes);
     const std::size_t counts = result.clipped.empty() ? 0 : result.wrongBits.size() / result.clipped.size();
     put(counts, bytes);
+    const bool hasReceptions = !result.receptions.empty();
+    put(hasReceptions ? 1 : 0, bytes);
     std::size_t next = 0;  // the first frame not yet packed
     for (std::size_t frame = 0; frame < result.clipped.size(); ++frame) {
         const std::uint32_t* const wrongBits = result.wrongBits.data() + frame * counts;
         const bool isQuiet = std::all_of(wrongBits, wrongBits + counts, [](std::uint32_t wrong) { return wrong == 0; });
-        if (isQuiet && result.clipped[frame] == 0) {
+        if (isQuiet && result.clipped[frame] == 0 && !hasReceptions) {
             continue;
         }
         put(frame - next, bytes);
         put(result.clipped[frame], bytes);
         for (std::size_t i = 0; i < counts; ++i) {
             put(wrongBits[i], bytes);
+            if (hasReceptions) {
+                put(result.receptions[frame * counts + i], bytes);
+            }
         }
         next = frame + 1;
     }
@@ -128,6 +141,7 @@ BatchResult unpackedResult(std::string_view bytes)
     const std::size_t frames = result.batch.count;
     result.clipped.resize(frames);
     result.wrongBits.resize(frames * counts);
+    result.receptions.resize(reader.get(1) == 1 ? frames * counts : 0);
     std::size_t frame = 0;
     while (!reader.isAtEnd()) {
         frame += static_cast<std::size_t>(reader.get(frames));
@@ -135,6 +149,9 @@ BatchResult unpackedResult(std::string_view bytes)
         result.clipped[frame] = reader.get32();
         for (std::size_t i = 0; i < counts; ++i) {
             result.wrongBits[frame * counts + i] = reader.get32();
+            if (!result.receptions.empty()) {
+                result.receptions[frame * counts + i] = {reader.get(), reader.get(), reader.get(), reader.get()};
+            }
         }
         ++frame;
     }

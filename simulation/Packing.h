@@ -11,7 +11,7 @@ namespace morvik::simulation {
 
 std::string packed(const FrameBatch& batch);
 
-/// Frames without wrong bits or clipped values take no space: most of them, where error rates are low.
+/// Code blocks without wrong bits or clipped values take no space: most of them, where error rates are low.
 std::string packed(const BatchResult& result);
 
 /// Inverses of packed(). Throw std::runtime_error if the bytes are malformed.

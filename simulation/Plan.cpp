@@ -11,16 +11,20 @@
 
 #include "base/Numbers.h"
 #include "base/Shown.h"
+#include "link/channel/Decibels.h"
 #include "link/channel/DefaultScale.h"
+#include "link/coding/CodeBlocks.h"
 
 namespace morvik::simulation {
 
 namespace {
 
-int automaticMilliScale(unsigned K, unsigned algorithm, int milliDecibels)
+int automaticMilliScale(const Point& point)
 {
-    return static_cast<int>(
-        std::lround(1000 * morvik::link::defaultScale(static_cast<int>(algorithm), K, milliDecibels)));
+    const auto algorithm = static_cast<int>(point.algorithm);
+    const double scale = point.link.isPlainBpsk() ? link::defaultScale(algorithm, point.blockSize, point.milliDecibels)
+                                                  : automaticScale(point, 0);
+    return std::max(static_cast<int>(std::lround(1000 * scale)), 1);
 }
 
 std::vector<int> range(int start, int step, int stop)
@@ -32,9 +36,54 @@ std::vector<int> range(int start, int step, int stop)
     return values;
 }
 
-const std::vector<int>& milliDecibelsOf(const Sweep& sweep, const std::vector<int>& usual)
+std::vector<int> milliDecibelsOf(const Sweep& sweep, const LinkFormat& format, unsigned K)
 {
-    return sweep.milliDecibels.empty() ? usual : sweep.milliDecibels;
+    if (!sweep.milliDecibels.empty()) {
+        return sweep.milliDecibels;
+    }
+    const bool isUsual = format.isPlainBpsk() && sweep.axis == Axis::ebn0;
+    return isUsual ? usualMilliDecibels(K) : usualMilliEsn0(format, K);
+}
+
+/// The block sizes that a format is combined with.
+std::vector<unsigned> blockSizesOf(const Sweep& sweep, const LinkFormat& format)
+{
+    return format.hasTransportBlocks() ? std::vector{link::codeBlocksOf(format.transportBlockSize).sizePlus}
+                                       : sweep.blockSizes;
+}
+
+/// Completes a point of a curve at a place on the axis: the other axis and the scale.
+Point pointAt(Point point, int milliDecibels, bool isOnEsn0)
+{
+    const double bitsPerSymbol = bitsPerSymbolOf(point.link, point.blockSize);
+    const double ratio = link::ratioOf(milliDecibels);
+    point.milliDecibels = isOnEsn0 ? link::milliDecibelsOf(ratio / bitsPerSymbol) : milliDecibels;
+    if (!point.link.isPlainBpsk()) {
+        point.milliEsn0 = isOnEsn0 ? milliDecibels : link::milliDecibelsOf(ratio * bitsPerSymbol);
+    }
+    point.milliScale = point.scaleOption ? *point.scaleOption : automaticMilliScale(point);
+    return point;
+}
+
+/// Appends the points of one format and block size.
+void appendPoints(const Sweep& sweep, const LinkFormat& format, unsigned K, std::vector<Point>& points)
+{
+    const std::vector<int> places = milliDecibelsOf(sweep, format, K);
+    // Where no place is given, a format's usual ones are on the axis of Es/N0.
+    const bool isOnEsn0 = sweep.axis == Axis::esn0 || (sweep.milliDecibels.empty() && !format.isPlainBpsk());
+    for (const unsigned numPu : sweep.numPus) {
+        for (const unsigned algorithm : sweep.algorithms) {
+            for (const ScaleOption& scale : sweep.scaleOptions) {
+                for (const unsigned iterations : sweep.iterations) {
+                    Point point = {K, numPu, algorithm, scale, 0, iterations, 0, format, Axis::ebn0, 0};
+                    point.axis = isOnEsn0 ? Axis::esn0 : Axis::ebn0;
+                    for (const int milliDecibels : places) {
+                        points.push_back(pointAt(point, milliDecibels, isOnEsn0));
+                    }
+                }
+            }
+        }
+    }
 }
 
 /// Appends the rows of a point; its iteration counts end at the point's own.
@@ -112,13 +161,35 @@ std::vector<int> usualMilliDecibels(unsigned K)
     return K <= 1024 ? range(0, 200, 3000) : range(0, 100, 1500);
 }
 
+std::vector<int> usualMilliEsn0(const LinkFormat& format, unsigned K)
+{
+    // Shannon's limit for the bits of a symbol, 2^r - 1, of which BPSK uses half the dimensions.
+    const double perSymbol = bitsPerSymbolOf(format, K);
+    const bool isReal = format.modulation == link::Modulation::bpsk;
+    const auto exponent = static_cast<int>(std::lround(3010.3 * perSymbol * (isReal ? 2 : 1)));
+    const double limit = (link::ratioOf(exponent) - 1) / (isReal ? 2 : 1);
+    constexpr int step = 500;
+    const int start = (link::milliDecibelsOf(limit) / step + 1) * step;
+    switch (format.fading) {
+    case link::Fading::none:
+        break;
+    case link::Fading::symbol:
+        return range(start, step, start + 20 * step);
+    case link::Fading::constant:
+        return range(start, 4 * step, start + 60 * step);
+    }
+    return range(start, step, start + 12 * step);
+}
+
 std::uint64_t countOfPoints(const Sweep& sweep)
 {
-    std::uint64_t decibels = 0;
-    for (const unsigned K : sweep.blockSizes) {
-        decibels += milliDecibelsOf(sweep, usualMilliDecibels(K)).size();
+    std::uint64_t places = 0;
+    for (const LinkFormat& format : sweep.formats) {
+        for (const unsigned K : blockSizesOf(sweep, format)) {
+            places += milliDecibelsOf(sweep, format, K).size();
+        }
     }
-    std::uint64_t count = decibels;
+    std::uint64_t count = places;
     for (const std::size_t values :
          {sweep.numPus.size(), sweep.algorithms.size(), sweep.scaleOptions.size(), sweep.iterations.size()}) {
         count *= values;
@@ -129,19 +200,9 @@ std::uint64_t countOfPoints(const Sweep& sweep)
 std::vector<Point> pointsOf(const Sweep& sweep)
 {
     std::vector<Point> points;
-    for (const unsigned K : sweep.blockSizes) {
-        const std::vector<int> usual = usualMilliDecibels(K);
-        for (const unsigned numPu : sweep.numPus) {
-            for (const unsigned algorithm : sweep.algorithms) {
-                for (const ScaleOption& scale : sweep.scaleOptions) {
-                    for (const unsigned iterations : sweep.iterations) {
-                        for (const int milliDecibels : milliDecibelsOf(sweep, usual)) {
-                            const int used = scale.value_or(automaticMilliScale(K, algorithm, milliDecibels));
-                            points.push_back({K, numPu, algorithm, scale, used, iterations, milliDecibels});
-                        }
-                    }
-                }
-            }
+    for (const LinkFormat& format : sweep.formats) {
+        for (const unsigned K : blockSizesOf(sweep, format)) {
+            appendPoints(sweep, format, K, points);
         }
     }
     std::sort(points.begin(), points.end());

@@ -23,11 +23,16 @@ struct Sweep {
     std::vector<unsigned> algorithms;
     std::vector<ScaleOption> scaleOptions;
     std::vector<unsigned> iterations;
-    std::vector<int> milliDecibels;  // if empty, a range suited to the block size
+    std::vector<int> milliDecibels;          // along the axis; if empty, a range suited to the block and its format
+    std::vector<LinkFormat> formats = {{}};  // those of plain code blocks are combined with the block sizes
+    Axis axis = Axis::ebn0;
 };
 
 /// The Eb/N0 values over which the error rates of K-bit blocks fall, in thousandths of a decibel.
 std::vector<int> usualMilliDecibels(unsigned K);
+
+/// The Es/N0 values over which the error rates of what is sent in this format fall, in thousandths of a decibel.
+std::vector<int> usualMilliEsn0(const LinkFormat& format, unsigned K);
 
 /// The number of points of a sweep.
 std::uint64_t countOfPoints(const Sweep& sweep);

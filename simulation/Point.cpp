@@ -1,11 +1,16 @@
 // Point: the parameters of one simulated error rate.
 #include "Point.h"
 
+#include <algorithm>
 #include <tuple>
 
 #include "base/Numbers.h"
 #include "base/Thousandths.h"
+#include "link/RatioScale.h"
+#include "link/channel/Decibels.h"
+#include "link/coding/CodeBlocks.h"
 #include "rules/Algorithms.h"
+#include "rules/Tail.h"
 
 namespace morvik::simulation {
 
@@ -13,15 +18,21 @@ namespace {
 
 auto curveOf(const Point& point)
 {
-    return std::tie(point.blockSize, point.numPu, point.algorithm, point.scaleOption, point.iterations);
+    return std::tie(
+        point.link, point.blockSize, point.numPu, point.algorithm, point.scaleOption, point.iterations, point.axis);
 }
 
 auto parametersOf(const Point& point)
 {
-    return std::tuple_cat(curveOf(point), std::tie(point.milliDecibels, point.milliScale));
+    return std::tuple_cat(curveOf(point), std::tie(point.milliDecibels, point.milliEsn0, point.milliScale));
 }
 
 }  // namespace
+
+std::string_view nameOf(Axis axis)
+{
+    return axis == Axis::ebn0 ? "ebn0" : "esn0";
+}
 
 bool operator==(const Point& a, const Point& b)
 {
@@ -36,6 +47,66 @@ bool operator<(const Point& a, const Point& b)
 bool onSameCurve(const Point& a, const Point& b)
 {
     return curveOf(a) == curveOf(b);
+}
+
+unsigned codeBlocksOf(const Point& point)
+{
+    return point.link.hasTransportBlocks() ? link::codeBlocksOf(point.link.transportBlockSize).count : 1;
+}
+
+std::uint64_t countedBitsOf(const Point& point)
+{
+    if (!point.link.hasTransportBlocks()) {
+        return point.blockSize;
+    }
+    const link::CodeBlocks blocks = link::codeBlocksOf(point.link.transportBlockSize);
+    return std::uint64_t{blocks.bits} + link::crcBits + std::uint64_t{blocks.count} * blocks.ownCrcBits();
+}
+
+std::uint64_t softValuesOf(const Point& point)
+{
+    const auto ofSize = [](std::uint64_t K) {
+        return 3 * (K + rules::tailPositions);
+    };
+    if (!point.link.hasTransportBlocks()) {
+        return ofSize(point.blockSize);
+    }
+    const link::CodeBlocks blocks = link::codeBlocksOf(point.link.transportBlockSize);
+    return blocks.countPlus * ofSize(blocks.sizePlus) + blocks.countMinus * ofSize(blocks.sizeMinus);
+}
+
+std::uint64_t symbolsOf(const LinkFormat& link, unsigned blockSize)
+{
+    const std::uint64_t bits =
+        link.hasTransportBlocks() ? link.codedBits : 3 * (std::uint64_t{blockSize} + rules::tailPositions);
+    const unsigned each = bitsPerSymbol(link.modulation);
+    return (bits + each - 1) / each;
+}
+
+double bitsPerSymbolOf(const LinkFormat& link, unsigned blockSize)
+{
+    const unsigned bits = link.hasTransportBlocks() ? link.transportBlockSize : blockSize;
+    return bits / static_cast<double>(symbolsOf(link, blockSize));
+}
+
+int milliEsn0Of(const Point& point)
+{
+    if (!point.link.isPlainBpsk()) {
+        return point.milliEsn0;
+    }
+    return link::milliDecibelsOf(link::ratioOf(point.milliDecibels) * bitsPerSymbolOf(point.link, point.blockSize));
+}
+
+double automaticScale(const Point& point, unsigned transmission)
+{
+    const double rate =
+        bitsPerSymbolOf(point.link, point.blockSize) / (bitsPerSymbol(point.link.modulation) * (transmission + 1.0));
+    return link::ratioScale(static_cast<int>(point.algorithm), point.link.modulation, rate);
+}
+
+bool isWide(const Point& point)
+{
+    return !point.link.isPlainBpsk() || point.axis == Axis::esn0;
 }
 
 std::string algorithmName(unsigned algorithm)

@@ -37,10 +37,14 @@ const Tally& PointCount::tally() const
 void PointCount::countInOrder(const BatchResult& result)
 {
     const std::uint32_t* wrongBits = result.wrongBits.data();
+    auto reception = result.receptions.begin();
     for (std::uint32_t i = 0; i < result.batch.count && !itsIsComplete; ++i) {
         const std::uint64_t frame = result.batch.first + i;
         for (ErrorCounts& errors : itsTally.errors) {
             errors.add(frame, *wrongBits++);
+            if (reception != result.receptions.end()) {
+                errors.reception.add(*reception++);
+            }
         }
         itsTally.clipped += result.clipped[i];
         itsTally.blocks += 1;

@@ -5,8 +5,6 @@
 #include <functional>
 #include <vector>
 
-#include "rules/Tail.h"
-
 namespace morvik::simulation {
 
 namespace {
@@ -24,14 +22,49 @@ bool areFailures(const std::vector<std::uint64_t>& failures, const FrameSet& fra
            std::adjacent_find(failures.begin(), failures.end(), std::greater_equal<>()) == failures.end();
 }
 
+/// Whether a count is above `most` times `each`, whose product may not fit in 64 bits.
+bool isMoreThan(std::uint64_t count, std::uint64_t most, std::uint64_t each)
+{
+    return count > 0 && (count - 1) / each >= most;
+}
+
+/// Checks what was counted of transport blocks.
+std::optional<std::string> impossibleReception(std::uint64_t blocks, const Point& point, const ErrorCounts& errors)
+{
+    const Reception& reception = errors.reception;
+    const std::uint64_t codeBlocks = codeBlocksOf(point);
+    const std::string ofBlocks = std::to_string(blocks) + " blocks of " + std::to_string(codeBlocks) + " code blocks";
+    if (reception.transmissions < blocks || isMoreThan(reception.transmissions, blocks, point.link.versions.size())) {
+        return cannotBe("sent_transmissions", reception.transmissions, ofBlocks);
+    }
+    const std::uint64_t decodings = reception.transmissions * codeBlocks;
+    if (reception.iterations < decodings || reception.iterations > decodings * point.iterations ||
+        (!point.link.stopsEarly && reception.iterations < decodings * point.iterations)) {
+        return cannotBe("run_iterations", reception.iterations, std::to_string(decodings) + " decoded code blocks");
+    }
+    if (reception.codeBlockErrors < errors.blockErrors ||
+        isMoreThan(reception.codeBlockErrors, errors.blockErrors, codeBlocks)) {
+        return cannotBe(
+            "code_block_errors",
+            reception.codeBlockErrors,
+            std::to_string(errors.blockErrors) + " wrong blocks of " + std::to_string(codeBlocks) + " code blocks");
+    }
+    if (reception.undetected > errors.blockErrors) {
+        return cannotBe(
+            "undetected_errors", reception.undetected, std::to_string(errors.blockErrors) + " wrong blocks");
+    }
+    return std::nullopt;
+}
+
 }  // namespace
 
 std::optional<std::string> impossibleCount(const FrameSet& frames,
-                                           unsigned K,
+                                           const Point& point,
                                            const ErrorCounts& errors,
                                            std::uint64_t clipped)
 {
     const std::uint64_t blocks = frames.size();
+    const std::uint64_t K = countedBitsOf(point);
     if (blocks > mostBlocks) {
         return cannotBe("blocks", blocks, std::to_string(mostBlocks) + " at most");
     }
@@ -40,7 +73,7 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
     if (errors.blockErrors > blocks) {
         return cannotBe("block_errors", errors.blockErrors, std::to_string(blocks) + " blocks");
     }
-    if (errors.bitErrors < errors.blockErrors || errors.bitErrors > errors.blockErrors * K) {
+    if (errors.bitErrors < errors.blockErrors || isMoreThan(errors.bitErrors, errors.blockErrors, K)) {
         return cannotBe("bit_errors", errors.bitErrors, wrongBlocks);
     }
     // A square is odd if its number is, so the two sums have the same parity.
@@ -48,7 +81,13 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
         errors.bitErrorSquares % 2 != errors.bitErrors % 2) {
         return cannotBe("bit_error_squares", errors.bitErrorSquares, std::to_string(errors.bitErrors) + " wrong bits");
     }
-    if (clipped > std::uint64_t{3} * (K + rules::tailPositions) * blocks) {
+    if (point.link.hasTransportBlocks()) {
+        if (auto impossible = impossibleReception(blocks, point, errors)) {
+            return impossible;
+        }
+    }
+    const std::uint64_t received = point.link.hasTransportBlocks() ? errors.reception.transmissions : blocks;
+    if (isMoreThan(clipped, received, softValuesOf(point))) {
         return cannotBe(
             "clipped_values", clipped, std::to_string(blocks) + " blocks of " + std::to_string(K) + " bits");
     }

@@ -24,10 +24,17 @@ bool endsIn(std::string_view text, std::string_view end)
     return text.size() > end.size() && text.substr(text.size() - end.size()) == end;
 }
 
-std::string headerLine()
+/// Whether any point is wide.
+bool isWide(const Results& results)
+{
+    return std::any_of(
+        results.rows.begin(), results.rows.end(), [](const ResultRow& row) { return isWide(row.point); });
+}
+
+std::string headerLine(bool isWide)
 {
     std::string line;
-    for (const Column& column : columns()) {
+    for (const Column& column : columns(isWide)) {
         line += (line.empty() ? "" : ",") + std::string(column.name);
     }
     return line;
@@ -41,25 +48,31 @@ void readField(const Column& column, const std::string& text, ResultRow& row, co
     }
 }
 
-/// Throws Error unless the row's numbers are possible, so that rates and bounds can be computed.
-void checkCounts(const ResultRow& row, const std::string& place)
+/// Throws Error unless the row's parameters fit together and its numbers are possible, so that rates and bounds can be
+/// computed.
+void checkRow(ResultRow& row, const std::string& place)
 {
-    if (const auto wrong = impossibleCount(row.frames, row.point.blockSize, row.errors, row.clipped)) {
+    if (!complete(row)) {
+        throw base::Error(place + ": transport_block_size, coded_bits and what belongs to them contradict each other");
+    }
+    if (const auto wrong = impossibleCount(row.frames, row.point, row.errors, row.clipped)) {
         throw base::Error(place + ": " + *wrong);
     }
 }
 
-ResultRow csvRow(const std::vector<std::string_view>& fields, const std::string& place)
+ResultRow csvRow(const std::vector<Column>& columns,
+                 const std::vector<std::string_view>& fields,
+                 const std::string& place)
 {
-    if (fields.size() != columns().size()) {
+    if (fields.size() != columns.size()) {
         throw base::Error(place + ": " + std::to_string(fields.size()) + " fields, expected " +
-                          std::to_string(columns().size()));
+                          std::to_string(columns.size()));
     }
     ResultRow row;
     for (std::size_t i = 0; i < fields.size(); ++i) {
-        readField(columns()[i], std::string(fields[i]), row, place);
+        readField(columns[i], std::string(fields[i]), row, place);
     }
-    checkCounts(row, place);
+    checkRow(row, place);
     return row;
 }
 
@@ -68,12 +81,14 @@ Results parseCsv(const std::string& text, const std::string& fileName)
     std::istringstream input(text);
     base::LineReader lines(input, fileName, base::largestText);
     base::CsvReader row(lines);
-    if (!row.next() || !row.is(headerLine())) {
-        lines.fail("no header of a result file, expected \"" + headerLine() + '"');
+    const bool hasHeader = row.next();
+    const bool isWide = hasHeader && row.is(headerLine(true));
+    if (!hasHeader || !(isWide || row.is(headerLine(false)))) {
+        lines.fail("no header of a result file, expected \"" + headerLine(false) + '"');
     }
     Results results;
     while (row.next()) {
-        results.rows.push_back(csvRow(row.fields(), lines.place()));
+        results.rows.push_back(csvRow(columns(isWide), row.fields(), lines.place()));
     }
     return results;
 }
@@ -100,10 +115,10 @@ ResultRow jsonRow(const base::Json& value, const std::string& place)
 {
     const base::JsonMembers members(value, place);
     ResultRow row;
-    for (const Column& column : columns()) {
+    for (const Column& column : columns(members.has("transport_block_size"))) {
         readField(column, jsonField(members, column), row, place);
     }
-    checkCounts(row, place);
+    checkRow(row, place);
     return row;
 }
 
@@ -153,10 +168,11 @@ ResultFormat formatOf(const std::string& fileName)
 
 std::string csvText(const Results& results)
 {
-    std::string text = headerLine() + '\n';
+    const bool wide = isWide(results);
+    std::string text = headerLine(wide) + '\n';
     for (const ResultRow& row : results.rows) {
         std::string line;
-        for (const Column& column : columns()) {
+        for (const Column& column : columns(wide)) {
             line += (line.empty() ? "" : ",") + column.write(row);
         }
         text += line + '\n';
@@ -169,9 +185,10 @@ std::string jsonText(const Results& results)
     std::string text = "{\n  \"version\": " + base::jsonString(results.version) +
                        ",\n  \"command\": " + base::jsonString(results.command) + ",\n  \"rows\": [";
     const char* separator = "\n";
+    const bool wide = isWide(results);
     for (const ResultRow& row : results.rows) {
         std::string object;
-        for (const Column& column : columns()) {
+        for (const Column& column : columns(wide)) {
             object += (object.empty() ? "" : ", ") + base::jsonString(std::string(column.name)) + ": " +
                       jsonValue(column, row);
         }

@@ -38,6 +38,14 @@ double bitErrorRate(const ResultRow& row);
 double blockErrorRate(const ResultRow& row);
 double clippedFraction(const ResultRow& row);
 
+/// What the blocks took. Plain code blocks are sent once, with all iterations and without a CRC.
+Reception receptionOf(const ResultRow& row);
+double meanIterations(const ResultRow& row);     // of a code block, each time it is decoded
+double meanTransmissions(const ResultRow& row);  // of a block
+
+/// Information bits of right blocks for each symbol sent.
+double throughput(const ResultRow& row);
+
 /// The bounds of its rates.
 Bounds bitErrorBounds(const ResultRow& row);
 Bounds blockErrorBounds(const ResultRow& row);

@@ -32,7 +32,7 @@ bool isBeyond(const Plan& plan, const PointResult& result)
 {
     const StopRules& rules = plan.rules;
     const ErrorCounts& errors = result.tally.errors.back();
-    const std::uint64_t bitsOfLast = plan.points[result.number].blockSize;
+    const std::uint64_t bitsOfLast = countedBitsOf(plan.points[result.number]);
     return result.tally.blocks > plan.mostFrames() || (rules.blockErrors && errors.blockErrors > *rules.blockErrors) ||
            (rules.bitErrors && errors.bitErrors >= *rules.bitErrors &&
             errors.bitErrors - *rules.bitErrors >= bitsOfLast);
@@ -86,7 +86,7 @@ void checkPoint(const Plan& plan, const PointResult& result, const std::string& 
     }
     const FrameSet frames({plan.frames.from, plan.frames.from + tally.blocks});
     for (const ErrorCounts& errors : tally.errors) {
-        if (const auto wrong = impossibleCount(frames, point.blockSize, errors, tally.clipped)) {
+        if (const auto wrong = impossibleCount(frames, point, errors, tally.clipped)) {
             throw base::Error(place + ": " + *wrong);
         }
     }

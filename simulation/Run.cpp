@@ -26,8 +26,9 @@ constexpr unsigned batchesWaiting = 64;
 /// A batch takes some milliseconds: long compared with handing it out, short compared with what people notice.
 std::uint32_t largestBatch(const Point& point)
 {
-    constexpr unsigned bitIterations = 1U << 22;
-    return std::max(bitIterations / (point.blockSize * point.iterations), smallestBatch);
+    constexpr std::uint64_t bitIterations = 1U << 22;
+    const std::uint64_t of = std::uint64_t{point.blockSize} * codeBlocksOf(point) * point.iterations;
+    return std::max(static_cast<std::uint32_t>(bitIterations / of), smallestBatch);
 }
 
 double secondsSince(Clock::time_point start)

@@ -8,6 +8,8 @@
 #include <optional>
 #include <vector>
 
+#include "Tally.h"
+
 namespace morvik::simulation {
 
 /// Consecutive frames of a point of the plan.
@@ -25,6 +27,7 @@ struct BatchResult {
     FrameBatch batch;
     std::vector<std::uint32_t> wrongBits;  // of each frame, for each iteration count
     std::vector<std::uint32_t> clipped;    // clipped soft values of each frame
+    std::vector<Reception> receptions;     // as wrongBits; none of plain code blocks
 };
 
 /// Simulates batches and returns their results, in any order. All workers know the plan.

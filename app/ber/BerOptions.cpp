@@ -71,27 +71,27 @@ void appendIterations(const std::string& text, std::vector<unsigned>& values)
     values.push_back(*iterations);
 }
 
-/// What --ebn0 takes besides numbers, for messages.
+/// What the axes take besides numbers, for messages.
 constexpr char orRange[] = ", and START:STEP:STOP";
 
-void appendEbn0(const std::string& text, std::vector<int>& values)
+void appendDecibels(const std::string& option, const std::string& text, std::vector<int>& values)
 {
     const std::vector<std::string> parts = splitAt(':', text);
     if (parts.size() == 1) {
-        values.push_back(readMilliDecibels(text, orRange));
+        values.push_back(readMilliDecibels(option, text, orRange));
         return;
     }
     if (parts.size() != 3) {
-        refuse("--ebn0", text, "a range is START:STEP:STOP");
+        refuse(option, text, "a range is START:STEP:STOP");
     }
-    const int start = readMilliDecibels(parts[0], orRange);
-    const int step = readMilliDecibels(parts[1], orRange);
-    const int stop = readMilliDecibels(parts[2], orRange);
+    const int start = readMilliDecibels(option, parts[0], orRange);
+    const int step = readMilliDecibels(option, parts[1], orRange);
+    const int stop = readMilliDecibels(option, parts[2], orRange);
     if (step <= 0) {
-        refuse("--ebn0", text, "the step of a range has to be above 0");
+        refuse(option, text, "the step of a range has to be above 0");
     }
     if (stop < start) {
-        refuse("--ebn0", text, "the range is empty: its stop is below its start");
+        refuse(option, text, "the range is empty: its stop is below its start");
     }
     for (int value = start; value <= stop; value += step) {
         values.push_back(value);
@@ -161,13 +161,28 @@ ReplayedFrame parseReplay(const std::string& text)
 
 // ---- The options in groups
 
+/// Es/N0 and Eb/N0, of which one can be given.
+void addAxis(CLI::App& command, simulation::Sweep& sweep)
+{
+    const auto add = [&](const std::string& option, simulation::Axis axis, const std::string& description) {
+        const auto append = [option, axis, &sweep](const std::string& text, std::vector<int>& values) {
+            sweep.axis = axis;
+            appendDecibels(option, text, values);
+        };
+        return addListOption(command, option, sweep.milliDecibels, append, description)
+            ->type_name("START:STEP:STOP|X[,X...]");
+    };
+    CLI::Option* const ebn0 =
+        add("--ebn0", simulation::Axis::ebn0, "Eb/N0 in dB; by default where the size's rates fall");
+    add("--esn0", simulation::Axis::esn0, "Instead of --ebn0: Es/N0, of a symbol, in dB")->excludes(ebn0);
+}
+
 void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
 {
     const DecoderOptions usual;
     const auto usualUnits = static_cast<unsigned>(usual.generics.C_NUM_PU);
     const auto usualAlgorithm = static_cast<unsigned>(usual.generics.C_ALGORITHM_TYPE);
-    addListOption(command, "--block-size", sweep.blockSizes, appendBlockSize, "Bits of a block, K")
-        ->required()
+    addListOption(command, "--block-size", sweep.blockSizes, appendBlockSize, "Send plain code blocks of K bits")
         ->check(offer(blockSizeWords()))
         ->type_name("K[,K...]");
     sweep.numPus = {usualUnits};
@@ -189,7 +204,8 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
                   "--scale",
                   sweep.scaleOptions,
                   appendScale,
-                  "Steps of the soft values for amplitude 1; auto: what suits the algorithm and Eb/N0")
+                  "Steps of the soft values for amplitude 1 of plain BPSK, otherwise for a log-likelihood ratio of 1; "
+                  "auto: what suits the algorithm and the channel")
         ->check(offer({"auto"}))
         ->type_name("X[,X...]")
         ->default_str("auto");
@@ -197,9 +213,7 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
     addListOption(command, "--iterations", sweep.iterations, appendIterations, "Turbo iterations, 1 to 15")
         ->type_name("N[,N...]")
         ->default_str(std::to_string(usual.iterations));
-    addListOption(
-        command, "--ebn0", sweep.milliDecibels, appendEbn0, "Eb/N0 in dB; by default where the size's rates fall")
-        ->type_name("START:STEP:STOP|X[,X...]");
+    addAxis(command, sweep);
 }
 
 void addRuleOptions(CLI::App& command, BerOptions& options)
@@ -298,16 +312,6 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
 
 // ---- The command that repeats a run
 
-template <class Values, class Text>
-std::string listed(const Values& values, Text textOf)
-{
-    std::string list;
-    for (const auto& value : values) {
-        list += (list.empty() ? "" : ",") + textOf(value);
-    }
-    return list;
-}
-
 /// Lists ascending values; three or more with equal steps become a range.
 std::string rangesText(const std::vector<int>& values)
 {
@@ -337,13 +341,16 @@ std::string commandOf(const BerOptions& options, const simulation::StopRules& ru
     const auto add = [&command](const std::string& option, const std::string& value) {
         command += ' ' + option + ' ' + value;
     };
-    add("--block-size", listed(sweep.blockSizes, number));
+    if (!sweep.blockSizes.empty()) {
+        add("--block-size", listed(sweep.blockSizes, number));
+    }
+    command += commandOf(options.link);
     add("--num-pu", listed(sweep.numPus, number));
     add("--algorithm", listed(sweep.algorithms, simulation::algorithmName));
     add("--scale", listed(sweep.scaleOptions, simulation::scaleOptionText));
     add("--iterations", listed(sweep.iterations, number));
     if (!sweep.milliDecibels.empty()) {
-        add("--ebn0", rangesText(sweep.milliDecibels));
+        add(sweep.axis == simulation::Axis::ebn0 ? "--ebn0" : "--esn0", rangesText(sweep.milliDecibels));
     }
     const auto addCount = [&](const std::string& option, const std::optional<std::uint64_t>& count) {
         if (count) {
@@ -388,10 +395,14 @@ simulation::StopRules rulesOf(const BerOptions& options)
 void addBerOptions(CLI::App& command, BerOptions& options)
 {
     addSweepOptions(command, options.sweep);
+    addLinkOptions(command, options.link);
     addRuleOptions(command, options);
     addExecutionOptions(command, options);
     addPictureOptions(command, options.pictures);
     command.callback([&options] {
+        if (options.sweep.blockSizes.empty() && !options.link.hasTransportBlocks()) {
+            throw CLI::RequiredError("--block-size, --transport-block-size or --mcs");
+        }
         if (options.quiet && options.output.empty() && !options.pictures.isAskedFor()) {
             throw CLI::RequiresError("--quiet", "--output, --plot or --report");
         }
@@ -403,13 +414,24 @@ simulation::Plan planOf(const BerOptions& options)
     if (options.eachIteration && options.sweep.iterations.size() > 1) {
         throw base::Error("--each-iteration counts up to one number of --iterations, give only the largest");
     }
-    const std::uint64_t points = simulation::countOfPoints(options.sweep);
+    const std::vector<unsigned>& versions = options.link.versions;
+    if (options.eachIteration && versions.size() > 1) {
+        throw base::Error("--each-iteration counts one transmission, --redundancy-versions " +
+                          simulation::versionsText(versions, ',') + " are " + std::to_string(versions.size()));
+    }
+    if (options.eachIteration && options.link.stopsEarly.value_or(false)) {
+        throw base::Error(
+            "--each-iteration counts after every iteration, --early-stop crc keeps one: give one of them");
+    }
+    simulation::Sweep sweep = options.sweep;
+    sweep.formats = formatsOf(options.link, !sweep.blockSizes.empty());
+    const std::uint64_t points = simulation::countOfPoints(sweep);
     if (points > mostPoints) {
         throw base::Error("the lists combine to " + std::to_string(points) + " points, a run has " +
                           std::to_string(mostPoints) + " at most");
     }
     simulation::Plan plan;
-    plan.points = simulation::pointsOf(options.sweep);
+    plan.points = simulation::pointsOf(sweep);
     plan.eachIteration = options.eachIteration;
     plan.rules = rulesOf(options);
     plan.frames = options.frames.value_or(plan.frames);

@@ -8,6 +8,7 @@
 #include <optional>
 #include <string>
 
+#include "LinkOptions.h"
 #include "Pictures.h"
 #include "simulation/Plan.h"
 
@@ -22,6 +23,7 @@ struct ReplayedFrame {
 /// The options given; empty where the default depends on other options.
 struct BerOptions {
     simulation::Sweep sweep;
+    LinkOptions link;
     bool eachIteration = false;
     std::optional<std::uint64_t> blockErrors;
     std::optional<std::uint64_t> bitErrors;

@@ -11,7 +11,9 @@
 #include <stdexcept>
 #include <string_view>
 
+#include "LinkWords.h"
 #include "base/Error.h"
+#include "base/Numbers.h"
 #include "base/Text.h"
 #include "base/Thousandths.h"
 #include "simulation/Confidence.h"
@@ -75,13 +77,25 @@ struct Line {
     }
 };
 
-std::string headLine(bool eachIteration)
+std::string headLine(bool eachIteration, const Point& point)
 {
     Line line = {"point", {}, "Eb/N0", "blocks", "failed", "BLER", "95 % bounds", "BER", "blocks/s", "time"};
+    if (point.axis == simulation::Axis::esn0) {
+        line.ebn0 = "Es/N0";
+    }
+    if (point.link.hasTransportBlocks()) {
+        line.ber = "bit/symb";
+    }
     if (eachIteration) {
         line.iterations = "iter";
     }
     return line.text();
+}
+
+/// Along the axis, in thousandths of a decibel.
+int placeOf(const Point& point)
+{
+    return point.axis == simulation::Axis::ebn0 ? point.milliDecibels : milliEsn0Of(point);
 }
 
 Line lineOf(const ResultRow& row, bool eachIteration)
@@ -97,15 +111,24 @@ Line lineOf(const ResultRow& row, bool eachIteration)
     if (eachIteration) {
         line.iterations = std::to_string(row.point.iterations);
     }
-    line.ebn0 = base::thousandthsText(row.point.milliDecibels);
+    line.ebn0 = base::thousandthsText(placeOf(row.point));
     line.blocks = std::to_string(blocks);
     line.failed = std::to_string(row.errors.blockErrors);
     line.bler = rate(simulation::blockErrorRate(row));
     line.bounds = (hasFailed ? rateText(bounds.low, 1) + ' ' : "below ") + rateText(bounds.high, 1);
-    line.ber = rate(simulation::bitErrorRate(row));
+    line.ber = row.point.link.hasTransportBlocks()
+                   ? base::numberText(simulation::throughput(row), std::chars_format::fixed, 4)
+                   : rate(simulation::bitErrorRate(row));
     line.speed = row.seconds > 0 ? std::to_string(std::lround(static_cast<double>(blocks) / row.seconds)) : "";
     line.time = timeText(row.seconds);
     return line;
+}
+
+std::string curveText(const Point& point)
+{
+    return sentText(point) + receivedText(point.link) + ", " + std::to_string(point.numPu) + " units, " +
+           simulation::algorithmName(point.algorithm) + ", scale " + simulation::scaleOptionText(point.scaleOption) +
+           ", " + base::counted(point.iterations, "iteration");
 }
 
 std::string timeLeft(const Plan& plan, const PointResult& point)
@@ -171,10 +194,7 @@ void LiveTable::writeHeading(const Point& point)
         return;
     }
     eraseMovingLine();
-    write((itsHeading ? "\nK = " : "K = ") + std::to_string(point.blockSize) + ", " + std::to_string(point.numPu) +
-          " units, " + simulation::algorithmName(point.algorithm) + ", scale " +
-          simulation::scaleOptionText(point.scaleOption) + ", " + base::counted(point.iterations, "iteration") + '\n' +
-          headLine(itsPlan.eachIteration) + '\n');
+    write((itsHeading ? "\n" : "") + curveText(point) + '\n' + headLine(itsPlan.eachIteration, point) + '\n');
     itsHeading = point;
 }
 

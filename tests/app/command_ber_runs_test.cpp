@@ -122,7 +122,7 @@ TEST_F(BerRuns, GiveTheFilesThatAreKept)
         const Arguments command = words(line);
         EXPECT_EQ(berFile(Arguments(command.begin() + 1, command.end()), command[0]), morvik.read(folder + command[0]));
     }
-    EXPECT_EQ(files, 4);
+    EXPECT_EQ(files, 7);
 }
 
 // ---- Runs that are stopped

@@ -345,7 +345,7 @@ TEST_F(Ber, RefusesSizesAndNamesTheNearest)
         expectNotAllowed("--block-size", size, all);
     }
     expectNotAllowed("--block-size", "40,", "", all);
-    expectUsageError({}, "--block-size is required");
+    expectUsageError({}, "--block-size, --transport-block-size or --mcs is required");
 }
 
 TEST_F(Ber, RefusesRanges)

@@ -8,6 +8,7 @@
 #include <stdexcept>
 
 #include "base/Thousandths.h"
+#include "link/FrameSource.h"
 #include "simulation/Replay.h"
 #include "simulation/ThreadWorkers.h"
 #include "support/Blocks.h"

@@ -1,0 +1,455 @@
+// LinkOptions: the arguments of `morvik ber` that say what is sent, and how.
+#include "LinkOptions.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+#include "Arguments.h"
+#include "Lists.h"
+#include "base/Error.h"
+#include "base/Numbers.h"
+#include "base/Thousandths.h"
+#include "link/coding/CodeBlocks.h"
+#include "link/coding/TransportBlock.h"
+
+namespace morvik {
+
+namespace {
+
+using simulation::LinkFormat;
+
+constexpr unsigned usualResourceElements = 120;  // of the 168 of a pair, without control and reference signals
+constexpr unsigned mostResourceElements = 168;
+constexpr unsigned mostCodedBits = 1U << 23;
+
+// ---- Elements of the lists
+
+/// Appends an integer from `least` to `most`.
+auto integersOf(const std::string& option, unsigned least, unsigned most)
+{
+    return [=](const std::string& text, std::vector<unsigned>& values) {
+        const auto value = base::parseNumber<std::uint32_t>(text);
+        if (!value || *value < least || *value > most) {
+            refuse(option, text, "allowed are the integers " + std::to_string(least) + " to " + std::to_string(most));
+        }
+        values.push_back(*value);
+    };
+}
+
+void appendCodeRate(const std::string& text, std::vector<int>& values)
+{
+    const auto rate = base::parseThousandths(text);
+    if (!rate || *rate <= 0 || *rate > 1000) {
+        refuse("--code-rate", text, "allowed are the numbers above 0 up to 1, with at most three decimals");
+    }
+    values.push_back(*rate);
+}
+
+void appendMcs(const std::string& text, std::vector<unsigned>& values)
+{
+    const std::vector<std::string> ends = splitAt(':', text);
+    const auto from = base::parseNumber<std::uint32_t>(ends.front());
+    const auto to = base::parseNumber<std::uint32_t>(ends.back());
+    const unsigned last = countOf(link::McsTable::qam64) - 1;
+    if (!from || !to || ends.size() > 2 || *from > *to || *to > last) {
+        refuse("--mcs", text, "allowed are 0 to " + std::to_string(last) + ", and FROM:TO");
+    }
+    for (unsigned index = *from; index <= *to; ++index) {
+        values.push_back(index);
+    }
+}
+
+void appendModulation(const std::string& text, std::vector<link::Modulation>& values)
+{
+    const auto modulation = link::modulationOf(text);
+    if (!modulation) {
+        refuse("--modulation", text, "allowed are bpsk, qpsk, 16qam, 64qam, 256qam");
+    }
+    values.push_back(*modulation);
+}
+
+std::vector<unsigned> parseVersions(const std::string& text)
+{
+    std::vector<unsigned> versions;
+    for (const std::string& part : splitAt(',', text)) {
+        integersOf("--redundancy-versions", 0, link::redundancyVersions - 1)(part, versions);
+    }
+    if (versions.size() > simulation::mostTransmissions) {
+        refuse("--redundancy-versions",
+               text,
+               "there are " + std::to_string(simulation::mostTransmissions) + " transmissions at most");
+    }
+    return versions;
+}
+
+// ---- Single values
+
+/// Adds an option that takes one of the words, each of which stands for a value.
+template <class Value, class Values, class NameOf>
+void addChoice(CLI::App& command,
+               const std::string& name,
+               std::optional<Value>& value,
+               const Values& values,
+               NameOf textOf,
+               const std::string& description)
+{
+    std::vector<std::string> words;
+    for (const Value each : values) {
+        words.emplace_back(textOf(each));
+    }
+    const auto take = [=, &value](const std::string& text) {
+        const auto found = std::find(words.begin(), words.end(), text);
+        if (found == words.end()) {
+            std::string allowed = "allowed are";
+            for (const std::string& word : words) {
+                allowed += (word == words.front() ? " " : ", ") + word;
+            }
+            refuse(name, text, allowed);
+        }
+        value = *(std::begin(values) + (found - words.begin()));
+    };
+    command.add_option_function<std::string>(name, take, description)
+        ->check(offer(words))
+        ->type_name("NAME")
+        ->default_str(words.front());
+}
+
+CLI::Option* addInteger(CLI::App& command,
+                        const std::string& name,
+                        std::optional<unsigned>& value,
+                        unsigned least,
+                        unsigned most,
+                        const std::string& description)
+{
+    const auto take = [=, &value](const std::string& text) {
+        std::vector<unsigned> values;
+        integersOf(name, least, most)(text, values);
+        value = values.front();
+    };
+    return command.add_option_function<std::string>(name, take, description)->type_name("N");
+}
+
+std::string_view stopName(bool stopsEarly)
+{
+    return stopsEarly ? "crc" : "none";
+}
+
+// ---- The options in groups
+
+void addSizes(CLI::App& command, LinkOptions& options)
+{
+    addListOption(command,
+                  "--transport-block-size",
+                  options.transportBlockSizes,
+                  integersOf("--transport-block-size", 1, link::mostTransportBits),
+                  "Send transport blocks of A bits, with CRC, segmentation and rate matching")
+        ->type_name("A[,A...]");
+    addListOption(command,
+                  "--coded-bits",
+                  options.codedBits,
+                  integersOf("--coded-bits", 1, mostCodedBits),
+                  "Bits of one transmission of a transport block, G")
+        ->type_name("G[,G...]");
+    addListOption(command,
+                  "--code-rate",
+                  options.codeRates,
+                  appendCodeRate,
+                  "Instead of --coded-bits: A / G, met as closely as whole symbols allow")
+        ->type_name("R[,R...]");
+    addListOption(command, "--mcs", options.mcsIndices, appendMcs, "Sizes and modulation of an MCS of 3GPP TS 36.213")
+        ->type_name("I[,I...]|FROM:TO");
+    addChoice(
+        command,
+        "--mcs-table",
+        options.mcsTable,
+        std::vector{link::McsTable::qam64, link::McsTable::qam256},
+        [](link::McsTable table) { return simulation::nameOf(table); },
+        "The table of --mcs, by its highest modulation: 64qam or 256qam");
+    addInteger(command,
+               "--resource-blocks",
+               options.resourceBlocks,
+               1,
+               link::mostResourceBlocks,
+               "Pairs of resource blocks of a transport block with --mcs");
+    addInteger(command,
+               "--resource-elements",
+               options.resourceElements,
+               1,
+               mostResourceElements,
+               "Symbols of a pair of resource blocks")
+        ->default_str(std::to_string(usualResourceElements));
+}
+
+/// An option that only transport blocks have, as given, or empty.
+std::string transportOption(const LinkOptions& options)
+{
+    if (!options.versions.empty()) {
+        return "--redundancy-versions " + simulation::versionsText(options.versions, ',');
+    }
+    if (options.softBufferBits) {
+        return "--soft-buffer-bits " + std::to_string(*options.softBufferBits);
+    }
+    if (options.softBufferSize) {
+        return "--soft-buffer-size " + std::to_string(*options.softBufferSize);
+    }
+    if (!options.codedBits.empty()) {
+        return "--coded-bits " + std::to_string(options.codedBits.front());
+    }
+    if (!options.codeRates.empty()) {
+        return "--code-rate " + base::thousandthsText(options.codeRates.front());
+    }
+    return options.stopsEarly.value_or(false) ? "--early-stop crc" : "";
+}
+
+/// Throws base::Error for options that contradict each other.
+void checkTogether(const LinkOptions& options, bool hasBlockSize)
+{
+    const auto expect = [](bool isGood, const std::string& message) {
+        if (!isGood) {
+            throw base::Error(message);
+        }
+    };
+    const bool hasSizes = !options.transportBlockSizes.empty();
+    const bool hasMcs = !options.mcsIndices.empty();
+    expect(!(hasBlockSize && options.hasTransportBlocks()),
+           std::string("--block-size sends plain code blocks, ") + (hasMcs ? "--mcs" : "--transport-block-size") +
+               " transport blocks: only one of them can be given");
+    expect(!(hasSizes && hasMcs), "--mcs has the sizes of --transport-block-size: only one of them can be given");
+    expect(options.hasTransportBlocks() || transportOption(options).empty(),
+           transportOption(options) + " needs transport blocks, by --transport-block-size or --mcs");
+    expect(hasMcs || (!options.resourceBlocks && !options.resourceElements && !options.mcsTable),
+           "--mcs-table, --resource-blocks and --resource-elements need --mcs");
+    if (hasSizes) {
+        expect(options.codedBits.empty() != options.codeRates.empty(),
+               "--transport-block-size needs either --coded-bits or --code-rate");
+    }
+    if (hasMcs) {
+        expect(options.codedBits.empty() && options.codeRates.empty() && options.modulations.empty(),
+               "--mcs sets what --coded-bits, --code-rate and --modulation do: they cannot be given with it");
+        expect(options.resourceBlocks.has_value(),
+               "--mcs needs --resource-blocks, 1 to " + std::to_string(link::mostResourceBlocks));
+        const unsigned last = countOf(options.mcsTable.value_or(link::McsTable::qam64)) - 1;
+        expect(options.mcsIndices.back() <= last,
+               "--mcs " + std::to_string(options.mcsIndices.back()) + " is not in --mcs-table " +
+                   std::string(simulation::nameOf(*options.mcsTable)) + ", allowed are 0 to " + std::to_string(last));
+    }
+}
+
+/// Whether a soft buffer has room for a bit of each code block.
+bool fitsBuffer(const LinkFormat& format, unsigned softBufferSize)
+{
+    try {
+        link::TransportBlockCode(
+            {format.transportBlockSize, format.codedBits, bitsPerSymbol(format.modulation), 1, softBufferSize});
+        return true;
+    } catch (const std::invalid_argument&) {
+        return false;
+    }
+}
+
+/// Throws base::Error if a transport block cannot be sent like this.
+void checkFormat(const LinkFormat& format, const std::string& size)
+{
+    const unsigned perSymbol = bitsPerSymbol(format.modulation);
+    const unsigned blocks = link::codeBlocksOf(format.transportBlockSize).count;
+    const unsigned G = format.codedBits;
+    if (G % perSymbol != 0) {
+        const unsigned below = G / perSymbol * perSymbol;
+        throw base::Error("--coded-bits " + std::to_string(G) + " is no multiple of the " + std::to_string(perSymbol) +
+                          " bits of --modulation " + std::string(nameOf(format.modulation)) + ", the nearest are " +
+                          (below > 0 ? std::to_string(below) + " and " : "") + std::to_string(below + perSymbol));
+    }
+    if (G < blocks * perSymbol || G > mostCodedBits) {
+        throw base::Error(size + ": " + std::to_string(G) + " coded bits cannot be, its " + std::to_string(blocks) +
+                          " code blocks take " + std::to_string(blocks * perSymbol) + " to " +
+                          std::to_string(mostCodedBits) + " with --modulation " +
+                          std::string(nameOf(format.modulation)));
+    }
+    if (format.softBufferSize > 0 && !fitsBuffer(format, format.softBufferSize)) {
+        unsigned tooSmall = format.softBufferSize;
+        unsigned large = UINT32_MAX - 1;
+        while (tooSmall + 1 < large) {
+            const unsigned middle = tooSmall + (large - tooSmall) / 2;
+            (fitsBuffer(format, middle) ? large : tooSmall) = middle;
+        }
+        throw base::Error("--soft-buffer-size " + std::to_string(format.softBufferSize) + " is too small for " + size +
+                          ", the least that holds a bit of each of its " + std::to_string(blocks) + " code blocks is " +
+                          std::to_string(large));
+    }
+}
+
+/// Whole symbols that meet a rate in thousandths most closely; at least one for each code block.
+unsigned codedBitsAt(unsigned size, int rate, unsigned perSymbol)
+{
+    const std::uint64_t symbols = (std::uint64_t{size} * 2000 / (static_cast<unsigned>(rate) * perSymbol) + 1) / 2;
+    const std::uint64_t least = link::codeBlocksOf(size).count;
+    return static_cast<unsigned>(std::min<std::uint64_t>(std::max(symbols, least) * perSymbol, UINT32_MAX));
+}
+
+/// Appends the formats of transport blocks of A bits, of which `format` has the rest.
+void appendSizes(const LinkOptions& options, unsigned A, LinkFormat format, std::vector<LinkFormat>& formats)
+{
+    const std::string size = "--transport-block-size " + std::to_string(A);
+    format.transportBlockSize = A;
+    for (const unsigned codedBits : options.codedBits) {
+        format.codedBits = codedBits;
+        checkFormat(format, size);
+        formats.push_back(format);
+    }
+    for (const int rate : options.codeRates) {
+        format.codedBits = codedBitsAt(A, rate, bitsPerSymbol(format.modulation));
+        checkFormat(format, size + " --code-rate " + base::thousandthsText(rate));
+        formats.push_back(format);
+    }
+}
+
+link::Modulation modulationOf(const link::Mcs& mcs)
+{
+    return *std::find_if(link::modulations.begin(), link::modulations.end(), [&mcs](link::Modulation modulation) {
+        return bitsPerSymbol(modulation) == mcs.bitsPerSymbol;
+    });
+}
+
+LinkFormat formatOf(const LinkOptions& options, unsigned index, LinkFormat format)
+{
+    const link::McsTable table = options.mcsTable.value_or(link::McsTable::qam64);
+    const link::Mcs mcs = mcsOf(table, index);
+    const unsigned pairs = *options.resourceBlocks;
+    format.mcs = {table, index};
+    format.modulation = modulationOf(mcs);
+    format.transportBlockSize = link::transportBlockSize(mcs.sizeIndex, pairs);
+    format.codedBits = pairs * options.resourceElements.value_or(usualResourceElements) * mcs.bitsPerSymbol;
+    checkFormat(format,
+                "--mcs " + std::to_string(index) + ", transport blocks of " +
+                    std::to_string(format.transportBlockSize) + " bits");
+    return format;
+}
+
+}  // namespace
+
+void addLinkOptions(CLI::App& command, LinkOptions& options)
+{
+    addSizes(command, options);
+    addListOption(command,
+                  "--modulation",
+                  options.modulations,
+                  appendModulation,
+                  "bpsk, qpsk, 16qam, 64qam or 256qam; by default qpsk for transport blocks, bpsk for code blocks")
+        ->check(offer({"bpsk", "qpsk", "16qam", "64qam", "256qam"}))
+        ->type_name("NAME[,NAME...]");
+    command
+        .add_option_function<std::string>(
+            "--redundancy-versions",
+            [&options](const std::string& text) { options.versions = parseVersions(text); },
+            "Of each transmission, in this order; the next one is sent only where a CRC failed")
+        ->type_name("V[,V...]")
+        ->default_str("0");
+    addInteger(command,
+               "--soft-buffer-bits",
+               options.softBufferBits,
+               2,
+               16,
+               "Add up received values in steps of this many bits, saturating; by default in full width");
+    addInteger(command,
+               "--soft-buffer-size",
+               options.softBufferSize,
+               1,
+               UINT32_MAX - 1,
+               "Soft buffer for a transport block, N_IR; by default unlimited");
+    addChoice(
+        command,
+        "--channel",
+        options.fading,
+        link::fadings,
+        [](link::Fading fading) { return nameOf(fading); },
+        "Gaussian noise: awgn; with Rayleigh fading of each symbol: rayleigh; of a transmission: block-rayleigh");
+    addChoice(
+        command,
+        "--demapper",
+        options.demapper,
+        link::demappers,
+        [](link::Demapper demapper) { return nameOf(demapper); },
+        "max-log: by the nearest points; exact: by all");
+    addChoice(command,
+              "--early-stop",
+              options.stopsEarly,
+              std::vector<bool>{false, true},
+              stopName,
+              "crc: each code block with the first iteration whose CRC fits; none: all --iterations");
+}
+
+std::vector<LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize)
+{
+    checkTogether(options, hasBlockSize);
+    LinkFormat format;
+    format.fading = options.fading.value_or(link::Fading::none);
+    format.demapper = options.demapper.value_or(link::Demapper::maxLog);
+    format.softBufferBits = options.softBufferBits.value_or(0);
+    format.softBufferSize = options.softBufferSize.value_or(0);
+    format.stopsEarly = options.stopsEarly.value_or(false);
+    std::vector<LinkFormat> formats;
+    if (options.hasTransportBlocks()) {
+        format.versions = options.versions.empty() ? std::vector{0U} : options.versions;
+    }
+    for (const unsigned index : options.mcsIndices) {
+        formats.push_back(formatOf(options, index, format));
+    }
+    const bool isPlain = !options.hasTransportBlocks();
+    const auto usual = isPlain ? link::Modulation::bpsk : link::Modulation::qpsk;
+    for (const link::Modulation modulation : options.modulations.empty() ? std::vector{usual} : options.modulations) {
+        format.modulation = modulation;
+        for (const unsigned A : options.transportBlockSizes) {
+            appendSizes(options, A, format, formats);
+        }
+        if (isPlain) {
+            formats.push_back(format);
+        }
+    }
+    return formats;
+}
+
+std::string commandOf(const LinkOptions& options)
+{
+    std::string command;
+    const auto add = [&command](bool isGiven, const std::string& option, auto textOf) {
+        command += isGiven ? ' ' + option + ' ' + textOf() : "";
+    };
+    const auto numbers = [](const auto& values) {
+        return [&values] {
+            return listed(values, [](auto value) { return std::to_string(value); });
+        };
+    };
+    const auto number = [](const std::optional<unsigned>& value) {
+        return [&value] {
+            return std::to_string(*value);
+        };
+    };
+    const auto name = [](const auto& value) {
+        return [&value] {
+            return std::string(nameOf(*value));
+        };
+    };
+    add(!options.transportBlockSizes.empty(), "--transport-block-size", numbers(options.transportBlockSizes));
+    add(!options.codedBits.empty(), "--coded-bits", numbers(options.codedBits));
+    add(!options.codeRates.empty(), "--code-rate", [&] { return listed(options.codeRates, base::thousandthsText); });
+    add(!options.mcsIndices.empty(), "--mcs", numbers(options.mcsIndices));
+    add(!options.mcsIndices.empty(), "--mcs-table", [&] {
+        return std::string(simulation::nameOf(options.mcsTable.value_or(link::McsTable::qam64)));
+    });
+    add(options.resourceBlocks.has_value(), "--resource-blocks", number(options.resourceBlocks));
+    add(options.resourceElements.has_value(), "--resource-elements", number(options.resourceElements));
+    add(!options.modulations.empty(), "--modulation", [&] {
+        return listed(options.modulations, [](link::Modulation modulation) { return std::string(nameOf(modulation)); });
+    });
+    add(!options.versions.empty(), "--redundancy-versions", [&] {
+        return simulation::versionsText(options.versions, ',');
+    });
+    add(options.softBufferBits.has_value(), "--soft-buffer-bits", number(options.softBufferBits));
+    add(options.softBufferSize.has_value(), "--soft-buffer-size", number(options.softBufferSize));
+    add(options.fading.has_value(), "--channel", name(options.fading));
+    add(options.demapper.has_value(), "--demapper", name(options.demapper));
+    add(options.stopsEarly.has_value(), "--early-stop", [&] { return std::string(stopName(*options.stopsEarly)); });
+    return command;
+}
+
+}  // namespace morvik

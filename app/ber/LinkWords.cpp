@@ -1,0 +1,46 @@
+// LinkWords: how blocks are sent and received, in words for tables and legends.
+#include "LinkWords.h"
+
+namespace morvik {
+
+std::string sentText(const simulation::Point& point)
+{
+    const simulation::LinkFormat& link = point.link;
+    if (!link.hasTransportBlocks()) {
+        return shortSentText(point);
+    }
+    return (link.mcs ? shortSentText(point) + ", " : "") + "A = " + std::to_string(link.transportBlockSize) +
+           ", G = " + std::to_string(link.codedBits) + ", " + std::string(nameOf(link.modulation));
+}
+
+std::string shortSentText(const simulation::Point& point)
+{
+    const simulation::LinkFormat& link = point.link;
+    if (link.mcs) {
+        return "MCS " + mcsText(link.mcs);
+    }
+    if (link.hasTransportBlocks()) {
+        return sentText(point);
+    }
+    const std::string size = "K = " + std::to_string(point.blockSize);
+    return link.isPlainBpsk() ? size : size + ", " + std::string(nameOf(link.modulation));
+}
+
+std::string receivedText(const simulation::LinkFormat& link)
+{
+    std::string text;
+    const auto append = [&text](bool isTold, const std::string& words) {
+        text += isTold ? ", " + words : "";
+    };
+    const std::string versions = simulation::versionsText(link.versions, ',');
+    append(link.fading != link::Fading::none, std::string(nameOf(link.fading)));
+    append(link.demapper != link::Demapper::maxLog, std::string(nameOf(link.demapper)) + " demapper");
+    append(link.versions.size() > 1, "versions " + versions);
+    append(link.versions.size() == 1 && link.versions[0] > 0, "version " + versions);
+    append(link.softBufferBits > 0, "soft buffer of " + std::to_string(link.softBufferBits) + " bits");
+    append(link.softBufferSize > 0, "N_IR = " + std::to_string(link.softBufferSize));
+    append(link.stopsEarly, "early stop");
+    return text;
+}
+
+}  // namespace morvik

@@ -1,0 +1,52 @@
+// TransportCheck: compares decisions with the code blocks that were sent, and checks their CRCs.
+#ifndef MORVIK_SIMULATION_TRANSPORTCHECK_H
+#define MORVIK_SIMULATION_TRANSPORTCHECK_H
+
+#include <cstdint>
+#include <utility>
+#include <vector>
+
+#include "link/TransportSource.h"
+
+namespace morvik::simulation {
+
+/// What is wrong in the decisions on a code block. Filler bits are known, whatever is decided.
+struct BlockVerdict {
+    std::uint32_t wrongBits = 0;
+    bool fits = false;  // its CRC: that of the transport block, if it is alone
+};
+
+class TransportCheck {
+public:
+    /// The source must outlive the check.
+    explicit TransportCheck(const link::TransportSource& source);
+
+    /// Begins with `count` frames that the source has begun with.
+    void begin(unsigned count);
+
+    /// Judges K decisions on code block r of a frame.
+    BlockVerdict check(unsigned frame, unsigned r, const std::uint8_t* decided);
+
+    /// Whether the transport block's CRC fits if all of a frame's code blocks are right but these: pairs of r and the
+    /// decisions on it.
+    using Decisions = std::pair<unsigned, std::vector<std::uint8_t>>;
+    bool fits(unsigned frame, const std::vector<Decisions>& others) const;
+
+    /// The bits of code block r, filler bits and CRC included.
+    std::vector<std::uint8_t> sentBits(unsigned frame, unsigned r) const;
+
+private:
+    const std::uint64_t* sent(unsigned frame, unsigned r) const
+    {
+        return &itsSent[frame * itsWords.back() + itsWords[r]];
+    }
+
+    const link::TransportSource& itsSource;
+    std::vector<std::size_t> itsWords;  // before each code block of a frame
+    std::vector<std::uint64_t> itsSent;
+    std::vector<std::uint64_t> itsDecided;
+};
+
+}  // namespace morvik::simulation
+
+#endif
