@@ -20,7 +20,9 @@ std::string titleOf(const Setting& setting)
             title += (title.empty() ? "" : ", ") + text;
         }
     };
-    append(setting.blockSize != 0, "K = " + std::to_string(setting.blockSize));
+    append(setting.blockSize != 0 && setting.sent.empty(), "K = " + std::to_string(setting.blockSize));
+    append(!setting.sent.empty(), setting.sent);
+    title += setting.received;
     append(setting.numPu != 0, base::counted(setting.numPu, "unit"));
     append(!setting.algorithm.empty(), setting.algorithm);
     append(setting.iterations != 0, base::counted(setting.iterations, "iteration"));
@@ -32,6 +34,9 @@ std::string titleOf(const Setting& setting)
 
 std::vector<Curve> curvesOf(const std::vector<Row>& rows)
 {
+    const bool hasIterations = std::any_of(rows.begin(), rows.end(), [&rows](const Row& row) {
+        return row.setting.iterations != rows.front().setting.iterations;
+    });
     std::vector<Curve> curves;
     for (const Row& row : rows) {
         const std::string title = titleOf(row.setting);
@@ -40,6 +45,10 @@ std::vector<Curve> curvesOf(const std::vector<Row>& rows)
         if (curve == curves.end()) {
             Setting others = row.setting;
             others.iterations = 0;
+            if (!hasIterations && !others.sent.empty()) {
+                others.sent.clear();
+                others.blockSize = 0;
+            }
             curve = curves.insert(curves.end(), Curve{title, false, {}, titleOf(others)});
         }
         curve->samples.push_back(row.sample);

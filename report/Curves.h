@@ -15,7 +15,8 @@ constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
 
 /// One point of a curve. The bounds are the 95 % confidence interval; without them no bar is drawn.
 struct Sample {
-    double ebn0 = 0;  // in dB
+    double ebn0 = 0;        // in dB
+    double esn0 = unknown;  // in dB, if it is the axis
 
     double ber = unknown;
     double berLow = unknown;
@@ -32,6 +33,11 @@ struct Sample {
     std::uint64_t blocks = 0;
     std::uint64_t bitErrors = 0;
     std::uint64_t blockErrors = 0;
+
+    // Information bits for each symbol; unknown of plain code blocks.
+    double throughput = unknown;
+    double throughputLow = unknown;
+    double throughputHigh = unknown;
 
     double clipped = unknown;  // fraction of clipped soft values
     unsigned iterations = 0;   // iterations before the count; 0 if unknown
@@ -52,7 +58,9 @@ struct Setting {
     unsigned numPu = 0;
     std::string algorithm;  // name
     unsigned iterations = 0;
-    std::string scale;  // steps for amplitude 1; empty or "auto" if it follows from the rest
+    std::string scale;      // as requested; empty or "auto" if it follows from the rest
+    std::string sent = {};  // what is sent, if it is not plain code blocks over BPSK; named instead of the block size
+    std::string received = {};  // what is unusual about the receiver, after ", "
 };
 
 /// A row of a result file.
@@ -63,7 +71,7 @@ struct Row {
 
 /// The curves of the rows, in the order of their first rows; samples are sorted by Eb/N0. The rows of one curve have
 /// the same setting, which is its title: "K = 512, 8 units, scaled, 6 iterations". Curves that differ only in their
-/// iterations form a family.
+/// iterations form a family or, where all have the same number, those that differ only in what is sent.
 std::vector<Curve> curvesOf(const std::vector<Row>& rows);
 
 /// The same samples against iterations: a curve for each family and each Eb/N0 with several of them. Curves that differ

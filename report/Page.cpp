@@ -25,6 +25,9 @@ constexpr char noFigure[] = "\u2013";
 
 std::string rateText(const Rate& rate)
 {
+    if (rate.isLinear) {
+        return std::isfinite(rate.value) ? base::numberText(rate.value, std::chars_format::fixed, 4) : noFigure;
+    }
     if (rate.below) {
         return "< " + report::rate(rate.high);
     }
@@ -38,6 +41,10 @@ std::string intervalText(const Rate& rate)
 {
     if (rate.below) {
         return "no error seen";
+    }
+    if (rate.isLinear && rate.hasInterval()) {
+        return base::numberText(rate.low, std::chars_format::fixed, 4) + " \u2026 " +
+               base::numberText(rate.high, std::chars_format::fixed, 4);
     }
     return rate.hasInterval() ? report::rate(rate.low) + " \u2026 " + report::rate(rate.high) : "";
 }
@@ -129,10 +136,11 @@ std::string curveJson(const View& view, std::size_t index)
 
 std::string rowJson(const Sample& sample)
 {
-    return "{\"row\":" + json(rowName(sample)) + ",\"ebn0\":" + json(sample.ebn0) +
-           ",\"place\":" + json(decibels(sample.ebn0)) + ",\"iterations\":" + std::to_string(sample.iterations) +
+    const double place = std::isfinite(sample.esn0) ? sample.esn0 : sample.ebn0;
+    return "{\"row\":" + json(rowName(sample)) + ",\"ebn0\":" + json(sample.ebn0) + ",\"esn0\":" + json(sample.esn0) +
+           ",\"place\":" + json(decibels(place)) + ",\"iterations\":" + std::to_string(sample.iterations) +
            ",\"ber\":" + json(bitErrorRate.of(sample)) + ",\"bler\":" + json(blockErrorRate.of(sample)) +
-           ",\"counts\":" + countsJson(sample) + '}';
+           ",\"bits\":" + json(throughput.of(sample)) + ",\"counts\":" + countsJson(sample) + '}';
 }
 
 /// The samples in the order of their rows, and the views.
@@ -212,11 +220,20 @@ constexpr char figureStart[] = R"(<section id="figure" aria-labelledby="figure-t
 <fieldset><legend>Show</legend>
 <label class="choice"><input type="radio" name="quantity" value="ber" autocomplete="off" checked><span>BER</span></label>
 <label class="choice"><input type="radio" name="quantity" value="bler" autocomplete="off"><span>BLER</span></label>
-</fieldset>
 )";
 
-constexpr char axisChoice[] = R"(<fieldset><legend>Against</legend>
-<label class="choice"><input type="radio" name="axis" value="ebn0" autocomplete="off"><span>Eb/N0</span></label>
+constexpr char throughputChoice[] =
+    R"(<label class="choice"><input type="radio" name="quantity" value="bits" autocomplete="off"><span>Throughput</span></label>
+)";
+
+constexpr char figureMiddle[] = R"(</fieldset>
+)";
+
+constexpr char axisChoiceStart[] = R"(<fieldset><legend>Against</legend>
+<label class="choice"><input type="radio" name="axis" value=")";
+
+constexpr char axisChoiceEnd[] =
+    R"(</span></label>
 <label class="choice"><input type="radio" name="axis" value="iterations" autocomplete="off"><span>Iterations</span></label>
 </fieldset>
 )";
@@ -233,6 +250,18 @@ constexpr char figureEnd[] =
 </section>
 )";
 
+bool hasThroughput(const View& view)
+{
+    return quantitiesOf(view.curves).back() == &throughput;
+}
+
+std::string axisChoice(const std::vector<View>& views)
+{
+    return views.size() < 2 ? ""
+                            : axisChoiceStart + std::string(views[0].axis->name) + "\" autocomplete=\"off\"><span>" +
+                                  views[0].axis->title + axisChoiceEnd;
+}
+
 bool hasClipped(const std::vector<Curve>& curves)
 {
     return std::any_of(curves.begin(), curves.end(), [](const Curve& curve) {
@@ -242,13 +271,14 @@ bool hasClipped(const std::vector<Curve>& curves)
     });
 }
 
-void writeRow(std::ostream& page, const Sample& sample, bool withClipped)
+void writeRow(std::ostream& page, const View& view, const Sample& sample, bool withClipped)
 {
     const auto cell = [&page](const std::string& content) {
         page << "<td>" << content << "</td>";
     };
     page << "<tr id=\"" << rowName(sample) << "\">";
-    cell(decibels(sample.ebn0));
+    const double place = view.axis->of(sample);
+    cell(std::isfinite(place) ? decibels(place) : noFigure);
     for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
         cell(escaped(rateText(quantity->of(sample))));
         cell(escaped(intervalText(quantity->of(sample))));
@@ -259,6 +289,9 @@ void writeRow(std::ostream& page, const Sample& sample, bool withClipped)
     if (withClipped) {
         cell(clippedText(sample));
     }
+    if (hasThroughput(view)) {
+        cell(rateText(throughput.of(sample)));
+    }
     page << "</tr>\n";
 }
 
@@ -268,18 +301,21 @@ void writePoints(std::ostream& page, const View& view)
     const bool withClipped = hasClipped(curves);
     page << "<section>\n<h2 id=\"points\">All points</h2>\n<div class=\"scroll\">\n"
             "<table class=\"points\" aria-labelledby=\"points\">\n<thead><tr><th "
-            "scope=\"col\">E<sub>b</sub>/N<sub>0</sub> "
+            "scope=\"col\">E<sub>"
+         << (view.axis == &esn0Axis ? 's' : 'b')
+         << "</sub>/N<sub>0</sub> "
             "(dB)</th><th scope=\"col\">BER</th><th scope=\"col\">95 %</th><th scope=\"col\">BLER</th>"
             "<th scope=\"col\">95 %</th><th scope=\"col\">Blocks</th><th scope=\"col\">Bit errors</th>"
             "<th scope=\"col\">Block errors</th>"
-         << (withClipped ? "<th scope=\"col\">Clipped</th>" : "") << "</tr></thead>\n";
+         << (withClipped ? "<th scope=\"col\">Clipped</th>" : "")
+         << (hasThroughput(view) ? "<th scope=\"col\">Bits per symbol</th>" : "") << "</tr></thead>\n";
     for (std::size_t i = 0; i < curves.size(); ++i) {
         page << "<tbody" << (curves[i].reference ? " class=\"reference\"" : "")
-             << ">\n<tr><th scope=\"rowgroup\" colspan=\"" << (withClipped ? 9 : 8)
+             << ">\n<tr><th scope=\"rowgroup\" colspan=\"" << 8 + (withClipped ? 1 : 0) + (hasThroughput(view) ? 1 : 0)
              << "\"><span class=\"swatch\" style=\"border-color: var(--" << colourName(view, i) << ")\"></span>"
              << escaped(curves[i].title) << (curves[i].reference ? " <small>reference</small>" : "") << "</th></tr>\n";
         for (const Sample& sample : curves[i].samples) {
-            writeRow(page, sample, withClipped);
+            writeRow(page, view, sample, withClipped);
         }
         page << "</tbody>\n";
     }
@@ -342,7 +378,8 @@ void writeReport(const std::string& fileName, const std::vector<Curve>& curves, 
     page.imbue(std::locale::classic());
     page << head(run.title, views) << "<body>\n<main>\n<h1>" << escaped(run.title) << "</h1>\n<p class=\"lead\">"
          << lead(curves) << "</p>\n"
-         << figureStart << (views.size() > 1 ? axisChoice : "") << figureEnd;
+         << figureStart << (hasThroughput(views[0]) ? throughputChoice : "") << figureMiddle << axisChoice(views)
+         << figureEnd;
     writePoints(page, views[0]);
     writeRun(page, run);
     page << "<footer>Rates are given with their 95 % confidence intervals. Where no error was seen, the rate is below "

@@ -63,7 +63,11 @@ std::string description(const std::vector<Curve>& curves)
 {
     const std::vector<View> views = viewsOf(curves);
     const std::string both = views.size() > 1 ? " and against iterations" : "";
-    std::string text = "Bit and block error rates against Eb/N0" + both + ", on a logarithmic scale. Series: ";
+    const bool hasThroughput = quantitiesOf(curves).back() == &throughput;
+    std::string text = (hasThroughput ? "Block error rates, on a logarithmic scale, and throughput against "
+                                      : "Bit and block error rates against ") +
+                       std::string(views[0].axis->title) + both +
+                       (hasThroughput ? ". Series: " : ", on a logarithmic scale. Series: ");
     const std::vector<Curve>& ordered = views[0].curves;
     for (std::size_t i = 0; i < ordered.size(); ++i) {
         text += (i == 0 ? "" : "; ") + ordered[i].title + (ordered[i].reference ? " (reference)" : "");

@@ -76,13 +76,13 @@ bool isDrawn(const std::vector<Curve>& curves, const Quantity& quantity)
 struct Band {
     Band(const View& view, int place) : name(view.axis->name), axis(*view.axis), curves(view.curves), top(place)
     {
-        for (const Quantity* quantity : {&bitErrorRate, &blockErrorRate}) {
+        for (const Quantity* quantity : quantitiesOf(curves)) {
             if (isDrawn(curves, *quantity)) {
                 quantities.push_back(quantity);
             }
         }
         if (quantities.empty()) {
-            quantities = {&bitErrorRate, &blockErrorRate};
+            quantities = quantitiesOf(curves);
         }
         for (std::size_t i = 0; i < curves.size(); ++i) {
             looks.push_back(lookOf(curves, i, axis));
@@ -269,9 +269,25 @@ private:
         return {range.from - margin, range.to + margin};
     }
 
+    /// Of a throughput, from 0 to a little above the greatest.
+    static Range linearRange(const Band& band, const Quantity& quantity)
+    {
+        double most = 0;
+        for (const Curve& curve : band.curves) {
+            for (const Sample& sample : curve.samples) {
+                const double value = quantity.of(sample).value;
+                most = std::isfinite(value) ? std::max(most, value) : most;
+            }
+        }
+        return {0, most > 0 ? 1.1 * most : 1};
+    }
+
     /// Whole decades, at least one, up to 1.
     static Range rateRange(const Band& band, const Quantity& quantity)
     {
+        if (quantity.isLinear) {
+            return linearRange(band, quantity);
+        }
         double least = 0.5;
         for (const Curve& curve : band.curves) {
             for (const Sample& sample : curve.samples) {
@@ -310,14 +326,17 @@ private:
                 << "set bmargin at screen " << up(band.top + panelHeight) << '\n'
                 << "set xrange [" << base::numberText(x.from) << ':' << base::numberText(x.to) << "]\n"
                 << "set yrange [" << base::numberText(y.from) << ':' << base::numberText(y.to) << "]\n"
-                << "set logscale y\nset mytics 10\nset format y '10^{%T}'\nset format x '%g'\n"
+                << (quantity.isLinear ? "unset logscale y\nset mytics 2\nset format y '%g'\n"
+                                      : "set logscale y\nset mytics 10\nset format y '10^{%T}'\n")
+                << "set format x '%g'\n"
                 << "set xtics nomirror " << (band.axis.isWhole ? "1" : "autofreq") << "\nset ytics nomirror\n"
                 << "set label 3 '" << band.axis.label << "' at "
                 << at((left + leftMargin + right - rightMargin) / 2, band.top + panelHeight + 46)
                 << " center textcolor rgb '" << ink << "'\n"
-                << "set label 2 '" << quantity.title << " (" << quantity.name << ")' at "
-                << at(left + leftMargin, band.top - 16) << " left textcolor rgb '" << faintInk << "'\n"
+                << "set label 2 " << quoted(heading(band, quantity)) << " at " << at(left + leftMargin, band.top - 16)
+                << " left textcolor rgb '" << faintInk << "'\n"
                 << "plot NaN notitle";
+        writeLimit(band, quantity);
         for (const bool reference : {true, false}) {
             for (std::size_t i = 0; i < band.curves.size(); ++i) {
                 if (band.curves[i].reference == reference) {
@@ -326,6 +345,27 @@ private:
             }
         }
         itsText << "\nunset label 1\n";  // it is drawn with the first panel
+    }
+
+    static bool hasLimit(const Band& band, const Quantity& quantity)
+    {
+        return quantity.isLinear && &band.axis == &esn0Axis;
+    }
+
+    static std::string heading(const Band& band, const Quantity& quantity)
+    {
+        if (!quantity.isLinear) {
+            return std::string(quantity.title) + " (" + quantity.name + ')';
+        }
+        return quantity.title + std::string(hasLimit(band, quantity) ? "; dotted: Shannon's limit" : "");
+    }
+
+    /// Shannon's limit for symbols of two dimensions.
+    void writeLimit(const Band& band, const Quantity& quantity)
+    {
+        if (hasLimit(band, quantity)) {
+            itsText << ", log(1 + 10**(x / 10.0)) / log(2) with lines lw 1.5 dt 3 lc rgb '" << faintInk << "' notitle";
+        }
     }
 
     static std::string colourOf(const Band& band, std::size_t curve)

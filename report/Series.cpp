@@ -11,7 +11,7 @@ namespace morvik::report {
 bool Rate::canBeDrawn() const
 {
     const double place = below ? high : value;
-    return std::isfinite(place) && place > 0;
+    return std::isfinite(place) && (place > 0 || isLinear);
 }
 
 bool Rate::hasInterval() const
@@ -26,8 +26,29 @@ const Quantity blockErrorRate = {"BLER", "Block error rate", [](const Sample& sa
                                      return Rate{sample.bler, sample.blerLow, sample.blerHigh, sample.blerBelow};
                                  }};
 
+const Quantity throughput = {
+    "bits",
+    "Throughput in bits per symbol",
+    [](const Sample& sample) {
+        return Rate{sample.throughput, sample.throughputLow, sample.throughputHigh, false, true};
+    },
+    true};
+
+std::vector<const Quantity*> quantitiesOf(const std::vector<Curve>& curves)
+{
+    const bool hasThroughput = std::any_of(curves.begin(), curves.end(), [](const Curve& curve) {
+        return !curve.reference && std::any_of(curve.samples.begin(), curve.samples.end(), [](const Sample& sample) {
+            return std::isfinite(sample.throughput);
+        });
+    });
+    return hasThroughput ? std::vector{&blockErrorRate, &throughput} : std::vector{&bitErrorRate, &blockErrorRate};
+}
+
 const Axis ebn0Axis = {"ebn0", "Eb/N0", "E_b/N_0 (dB)", false, [](const Sample& sample) {
                            return sample.ebn0;
+                       }};
+const Axis esn0Axis = {"esn0", "Es/N0", "E_s/N_0 (dB)", false, [](const Sample& sample) {
+                           return sample.esn0;
                        }};
 const Axis iterationAxis = {"iterations", "iterations", "Iterations", true, [](const Sample& sample) {
                                 return static_cast<double>(sample.iterations);
@@ -140,7 +161,12 @@ bool covers(const Curve& above, const Curve& below, const Axis& axis)
 std::vector<View> viewsOf(const std::vector<Curve>& curves)
 {
     constexpr std::size_t mostCurves = 40;
-    std::vector<View> views = {{&ebn0Axis, inOrder(curves)}};
+    const bool isOnEsn0 = std::any_of(curves.begin(), curves.end(), [](const Curve& curve) {
+        return !curve.reference && std::any_of(curve.samples.begin(), curve.samples.end(), [](const Sample& sample) {
+            return std::isfinite(sample.esn0);
+        });
+    });
+    std::vector<View> views = {{isOnEsn0 ? &esn0Axis : &ebn0Axis, inOrder(curves)}};
     const std::vector<Curve> across = againstIterations(views[0].curves);
     const auto own = std::count_if(across.begin(), across.end(), [](const Curve& curve) { return !curve.reference; });
     if (own > 0 && across.size() <= mostCurves) {

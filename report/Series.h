@@ -10,14 +10,15 @@
 
 namespace morvik::report {
 
-/// One of the two rates of a sample.
+/// A figure of a sample: one of its rates, or its throughput.
 struct Rate {
     double value;
     double low;
     double high;
     bool below;
+    bool isLinear = false;
 
-    /// It can be drawn on a logarithmic axis: a non-zero rate, or the upper bound of one.
+    /// It can be drawn on its axis: on a logarithmic one, a non-zero rate, or the upper bound of one.
     bool canBeDrawn() const;
 
     /// The interval is known.
@@ -29,10 +30,15 @@ struct Quantity {
     const char* name;   // "BER"
     const char* title;  // "Bit error rate"
     Rate (*of)(const Sample& sample);
+    bool isLinear = false;  // its axis; otherwise it is logarithmic
 };
 
 extern const Quantity bitErrorRate;
 extern const Quantity blockErrorRate;
+extern const Quantity throughput;
+
+/// The two that a plot shows: bit and block error rates or, where a throughput is known, this and block error rates.
+std::vector<const Quantity*> quantitiesOf(const std::vector<Curve>& curves);
 
 /// The horizontal axis of curves.
 struct Axis {
@@ -44,6 +50,7 @@ struct Axis {
 };
 
 extern const Axis ebn0Axis;
+extern const Axis esn0Axis;
 extern const Axis iterationAxis;
 
 /// Curves that are drawn together.
@@ -52,8 +59,9 @@ struct View {
     std::vector<Curve> curves;  // in order
 };
 
-/// The curves against Eb/N0 and, if some were counted after several iterations, against iterations, too. There is no
-/// view against iterations if it would have too many curves to tell apart.
+/// The curves against Es/N0, where it is known of any that is no reference, or Eb/N0, and, if some were counted after
+/// several iterations, against iterations, too. There is no view against iterations if it would have too many curves to
+/// tell apart.
 std::vector<View> viewsOf(const std::vector<Curve>& curves);
 
 /// Colours that distinguish series on white paper and on dark screens, for colour-blind eyes, too: those of M. Okabe

@@ -15,11 +15,16 @@
             name: "Eb/N0", of: sample => sample.ebn0, text: sample => `${sample.place} dB`, finest: 0, apart: 70, words: "Eb/N0 in dB",
             label: () => ["E", lowered(3, "b"), element("tspan", {dy: -3}, "/N"), lowered(3, "0"),
                           element("tspan", {dy: -3}, " (dB)")]},
+        esn0: {
+            name: "Es/N0", of: sample => sample.esn0, text: sample => `${sample.place} dB`, finest: 0, apart: 70, words: "Es/N0 in dB",
+            label: () => ["E", lowered(3, "s"), element("tspan", {dy: -3}, "/N"), lowered(3, "0"),
+                          element("tspan", {dy: -3}, " (dB)")]},
         iterations: {
             name: "Iterations", of: sample => sample.iterations, text: sample => sample.iterations, finest: 1, apart: 40,
             words: "iterations", label: () => ["Iterations"]},
     };
-    const names = {ber: "Bit error rate (BER)", bler: "Block error rate (BLER)"};
+    const names = {
+        ber: "Bit error rate (BER)", bler: "Block error rate (BLER)", bits: "Throughput in bits per symbol"};
     const margin = {left: 62, right: 16, top: 14, bottom: 52};
     const dashes = ["none", "9 5", "3 3", "10 4 2 4"];
     const arrowLength = 0.4;  // a bound's arrow goes down to this fraction of it
@@ -27,7 +32,7 @@
     const hidden = new Set();
     // Where there is one Eb/N0 only, the curves are those against iterations.
     let {axis, curves} = views.find(view => view.curves.some(curve => curve.samples.length > 1)) ?? views[0];
-    let quantity = "ber";
+    let quantity = rows.some(row => row.bits !== null) ? "bits" : "ber";
     let places = [];    // what was drawn: {curve, sample, x, y}
     let current = null; // the one that is looked at
 
@@ -42,7 +47,9 @@
 
     const rounded = value => Math.round(value * 100) / 100;
     const colourOf = curve => `var(--${curve.colour})`;
-    const drawn = rate => rate !== null && (rate.below ? rate.high : rate.value) > 0;
+    const isLinear = () => quantity === "bits";  // the other axes are logarithmic
+    const drawn = rate => rate !== null && ((rate.below ? rate.high : rate.value) > 0 || isLinear());
+    const hasPlace = sample => axisOf[axis].of(sample) !== null;
     // A curve that others cover is broader, to show on both sides of them.
     const widthOf = curve => curve.reference ? 1.5 : 2 + 2 * curve.layer;
     const sizeOf = curve => 3.6 + 1.6 * curve.layer;
@@ -76,14 +83,17 @@
     // All curves count, hidden or not, so that the axes stay where they are.
     function ranges() {
         const all = curves.flatMap(curve => curve.samples);
-        const x = all.filter(sample => drawn(sample.ber) || drawn(sample.bler)).map(axisOf[axis].of);
+        const x = all.filter(sample => hasPlace(sample) && (drawn(sample.ber) || drawn(sample.bler))).map(axisOf[axis].of);
         const y = all.map(sample => sample[quantity]).filter(drawn).flatMap(
             rate => rate.below ? [0.8 * arrowLength * rate.high] : rate.low > 0 ? [rate.value, rate.low] : [rate.value]);
         const least = Math.min(0.5, ...y);
         const from = x.length > 0 ? Math.min(...x) : 0;
         const to = x.length > 0 ? Math.max(...x) : 1;
         const space = from < to ? 0.03 * (to - from) : 0.5;
-        return {from: from - space, to: to + space, decades: -Math.floor(Math.log10(least))};
+        const values = all.map(sample => sample[quantity]).filter(drawn).map(rate => rate.value);
+        return {
+            from: from - space, to: to + space, decades: -Math.floor(Math.log10(least)),
+            most: 1.1 * Math.max(0, ...values) || 1};
     }
 
     function makeScale(width, height) {
@@ -93,7 +103,8 @@
         return {
             ...range, right, bottom,
             x: value => margin.left + (value - range.from) / (range.to - range.from) * (right - margin.left),
-            y: value => margin.top + Math.min(1, -Math.log10(value) / range.decades) * (bottom - margin.top),
+            y: value => margin.top + (bottom - margin.top) *
+                (isLinear() ? 1 - value / range.most : Math.min(1, -Math.log10(value) / range.decades)),
         };
     }
 
@@ -103,8 +114,14 @@
             "line", {class: kind, x1: rounded(x1), y1: rounded(y1), x2: rounded(x2), y2: rounded(y2)}));
         const label = (x, y, anchor, ...content) => group.append(element(
             "text", {x: rounded(x), y: rounded(y), "text-anchor": anchor}, ...content));
+        const rise = niceStep(scale.most, 8);
+        for (let i = 0; isLinear() && i * rise <= scale.most; ++i) {
+            const y = scale.y(i * rise);
+            line("major", margin.left, y, scale.right, y);
+            label(margin.left - 10, y + 4, "end", (i * rise).toFixed(rise < 1 ? 1 : 0));
+        }
         const every = Math.ceil(scale.decades / 10);
-        for (let decade = 0; decade <= scale.decades; ++decade) {
+        for (let decade = 0; !isLinear() && decade <= scale.decades; ++decade) {
             const y = scale.y(10 ** -decade);
             for (let digit = 2; digit < 10 && decade > 0; ++digit) {
                 const between = scale.y(digit * 10 ** -decade);
@@ -157,13 +174,30 @@
         ];
     }
 
+    // Shannon's limit for symbols of two dimensions, as far as it lies below the top.
+    function limit(scale) {
+        let path = "";
+        for (let i = 0; i <= 200; ++i) {
+            const x = scale.from + (scale.to - scale.from) * i / 200;
+            const bits = Math.log2(1 + 10 ** (x / 10));
+            if (bits <= scale.most) {
+                path += `${path === "" ? "M" : "L"}${rounded(scale.x(x))} ${rounded(scale.y(bits))}`;
+            }
+        }
+        const group = element("g", {class: "limit"});
+        group.append(
+            element("path", {d: path, fill: "none", stroke: "currentColor", "stroke-width": 1.5, "stroke-dasharray": "2 4"}),
+            element("text", {x: margin.left + 8, y: margin.top + 16}, "dotted: Shannon’s limit"));
+        return group;
+    }
+
     function drawCurve(curve, scale) {
         const group = element("g", {class: curve.reference ? "reference" : "own", "data-curve": curve.index});
         const above = [];
         let path = "";
         for (const sample of curve.samples) {
             const rate = sample[quantity];
-            if (!drawn(rate)) {
+            if (!drawn(rate) || !hasPlace(sample)) {
                 continue;
             }
             const x = scale.x(axisOf[axis].of(sample));
@@ -191,7 +225,7 @@
 
     function describe() {
         const shown = curves.filter(curve => !hidden.has(curve)).map(curve => curve.title);
-        return `${names[quantity]} against ${axisOf[axis].words}, on a logarithmic scale. ` +
+        return `${names[quantity]} against ${axisOf[axis].words}${isLinear() ? "" : ", on a logarithmic scale"}. ` +
             `Series: ${shown.join("; ") || "none"}. The table below has all the figures.`;
     }
 
@@ -202,6 +236,9 @@
         places = [];
         // The group's empty title keeps browsers from showing the picture's one beside the figures.
         const content = element("g", {}, element("title", {}), axes(scale));
+        if (isLinear() && axis === "esn0") {
+            content.append(limit(scale));
+        }
         for (const wanted of [true, false]) {
             for (const curve of curves) {
                 if (curve.reference === wanted && !hidden.has(curve)) {
@@ -243,7 +280,7 @@
         title.style.borderColor = colourOf(curve);
         const list = document.createElement("dl");
         pair(list, axisOf[axis].name, axisOf[axis].text(sample));
-        for (const [name, rate] of [["BER", sample.ber], ["BLER", sample.bler]]) {
+        for (const [name, rate] of [["BER", sample.ber], ["BLER", sample.bler], ["Bits per symbol", sample.bits]]) {
             if (rate !== null) {
                 pair(list, name, rate.text, rate.interval);
             }
@@ -369,6 +406,7 @@
         });
     }
     for (const choice of document.querySelectorAll("input[name=quantity]")) {
+        choice.checked = choice.value === quantity;
         choice.addEventListener("change", () => {
             quantity = choice.value;
             draw();

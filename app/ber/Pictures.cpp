@@ -5,6 +5,7 @@
 #include <iterator>
 #include <utility>
 
+#include "LinkWords.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
 #include "base/Thousandths.h"
@@ -28,30 +29,54 @@ report::Row rowOf(const simulation::ResultRow& row)
                      point.numPu,
                      simulation::algorithmName(point.algorithm),
                      point.iterations,
-                     simulation::scaleOptionText(point.scaleOption)};
-    drawn.sample = {point.milliDecibels / 1000.0,
-                    bitErrorRate(row),
-                    bits.low,
-                    bits.high,
-                    blockErrorRate(row),
-                    blocks.low,
-                    blocks.high,
-                    row.errors.bitErrors == 0,
-                    row.errors.blockErrors == 0,
-                    row.frames.size(),
-                    row.errors.bitErrors,
-                    row.errors.blockErrors,
-                    clippedFraction(row)};
+                     simulation::scaleOptionText(point.scaleOption),
+                     point.link.isPlainBpsk() ? "" : shortSentText(point),
+                     receivedText(point.link)};
+    report::Sample& sample = drawn.sample;
+    sample.ebn0 = point.milliDecibels / 1000.0;
+    if (point.axis == simulation::Axis::esn0) {
+        sample.esn0 = milliEsn0Of(point) / 1000.0;
+    }
+    sample.ber = bitErrorRate(row);
+    sample.berLow = bits.low;
+    sample.berHigh = bits.high;
+    sample.bler = blockErrorRate(row);
+    sample.blerLow = blocks.low;
+    sample.blerHigh = blocks.high;
+    sample.berBelow = row.errors.bitErrors == 0;
+    sample.blerBelow = row.errors.blockErrors == 0;
+    sample.blocks = row.frames.size();
+    sample.bitErrors = row.errors.bitErrors;
+    sample.blockErrors = row.errors.blockErrors;
+    sample.clipped = clippedFraction(row);
+    if (isWide(point)) {
+        const double most = bitsPerSymbolOf(point.link, point.blockSize) / meanTransmissions(row);
+        sample.throughput = throughput(row);
+        sample.throughputLow = most * (1 - blocks.high);
+        sample.throughputHigh = most * (1 - blocks.low);
+    }
     return drawn;
 }
 
-std::string rangeText(const std::vector<simulation::ResultRow>& rows)
+/// The parameter of the axis and its range.
+std::pair<std::string, std::string> rangeOf(const std::vector<simulation::ResultRow>& rows)
 {
-    const auto [least, most] = std::minmax_element(rows.begin(), rows.end(), [](const auto& a, const auto& b) {
-        return a.point.milliDecibels < b.point.milliDecibels;
-    });
-    return base::thousandthsText(least->point.milliDecibels) + " to " +
-           base::thousandthsText(most->point.milliDecibels) + " dB";
+    const bool isEsn0 = rows.front().point.axis == simulation::Axis::esn0;
+    const auto place = [isEsn0](const simulation::ResultRow& row) {
+        return isEsn0 ? milliEsn0Of(row.point) : row.point.milliDecibels;
+    };
+    const auto [least, most] = std::minmax_element(
+        rows.begin(), rows.end(), [&place](const auto& a, const auto& b) { return place(a) < place(b); });
+    return {isEsn0 ? "Es/N0" : "Eb/N0",
+            base::thousandthsText(place(*least)) + " to " + base::thousandthsText(place(*most)) + " dB"};
+}
+
+std::string channelText(const std::vector<simulation::ResultRow>& rows)
+{
+    const bool isPlain = std::all_of(
+        rows.begin(), rows.end(), [](const simulation::ResultRow& row) { return row.point.link.isPlainBpsk(); });
+    return isPlain ? "BPSK over white Gaussian noise; Eb/N0 counts the tail"
+                   : "Modulated symbols over white Gaussian noise, with the fading that is named";
 }
 
 /// Throws Error if both files are given and writing one would replace the other.
@@ -117,8 +142,8 @@ void Pictures::draw(const simulation::Results& results, const std::string& point
         report::writeReport(itsOptions.report,
                             curves,
                             {title,
-                             {{"Channel", "BPSK over white Gaussian noise; Eb/N0 counts the tail"},
-                              {"Eb/N0", rangeText(results.rows)},
+                             {{"Channel", channelText(results.rows)},
+                              rangeOf(results.rows),
                               {"Points", points},
                               {"Seed", std::to_string(results.rows.front().seed)},
                               {"Version", results.version}},
