@@ -15,9 +15,6 @@ namespace morvik::link {
 
 namespace {
 
-/// Index distance of soft values from one stream of a frame to the next; more than the K + 4 of any block.
-constexpr std::uint32_t streamStride = 8192;
-
 int checkedMilliDecibels(int milliDecibels)
 {
     if (milliDecibels < -(1 << 18) || milliDecibels >= 1 << 18) {
@@ -124,8 +121,7 @@ void FrameSource::receiveDiscrete(const FrameRandom& random, unsigned frame, std
                        &frames.streams[s][place * (itsK + rules::tailPositions)],
                        frames.clipped[place]);
     }
-    // As many as fit well into the caches.
-    if (itsSampler.size() >= 256) {
+    if (itsSampler.size() >= groupsAtOnce) {
         itsSampler.draw();
     }
 }

@@ -33,6 +33,12 @@ enum class Noise {
 /// not depend on the scale.
 class FrameSource {
 public:
+    /// Index distance of soft values from one stream of a frame to the next; more than the K + 4 of any block.
+    static constexpr std::uint32_t streamStride = 8192;
+
+    /// Groups of 64 values that fit well into the caches.
+    static constexpr std::size_t groupsAtOnce = 256;
+
     /// K                one of the 188 block sizes
     /// milliDecibels    Eb/N0 in thousandths of a decibel, from -262144 to 262143
     /// scale            steps of the soft values for amplitude 1, above 0

@@ -5,63 +5,23 @@
 #include <pybind11/pybind11.h>
 #include <pybind11/stl.h>
 
-#include <unistd.h>
-
-#include <cstring>
 #include <iterator>
 #include <optional>
 #include <utility>
 
+#include "Arrays.h"
 #include "Decoder.h"
 #include "ErrorRates.h"
+#include "Link.h"
 #include "base/Error.h"
 #include "base/Thousandths.h"
-#include "link/channel/Channel.h"
-#include "link/channel/DefaultScale.h"
-#include "link/coding/TurboEncoder.h"
-#include "rules/BlockSizes.h"
 #include "rules/Tail.h"
 #include "src/InstructionSetNames.h"
-
-namespace rules = morvik::rules;
 
 namespace py = pybind11;
 using namespace morvik::python;
 
 namespace {
-
-template <class Element>
-using Array = py::array_t<Element, py::array::c_style>;
-
-std::size_t sizeOf(py::ssize_t extent)
-{
-    return static_cast<std::size_t>(extent);
-}
-
-/// Releases the interpreter lock during its lifetime. If the interpreter has ended meanwhile, because this is a daemon
-/// thread, asking for the lock would unwind the thread, through owners of objects that must no longer be touched.
-/// Instead, the thread sleeps until the process ends.
-class Unlocked {
-public:
-    Unlocked() : itsThread(PyEval_SaveThread()) {}
-
-    ~Unlocked()
-    {
-        try {
-            PyEval_RestoreThread(itsThread);
-        } catch (...) {
-            for (;;) {
-                pause();
-            }
-        }
-    }
-
-    Unlocked(const Unlocked&) = delete;
-    Unlocked& operator=(const Unlocked&) = delete;
-
-private:
-    PyThreadState* itsThread;
-};
 
 // ---- Decoding
 
@@ -142,92 +102,6 @@ void addDecoder(py::module_& module)
     decoder.def("close", &Decoder::close, unlocked);
     decoder.def_property_readonly("closed", py::cpp_function(&Decoder::isClosed, unlocked));
     decoder.def_property_readonly("instruction_set", py::cpp_function(&Decoder::instructionSet, unlocked));
-}
-
-// ---- Encoder, interleaver and channel
-
-Array<std::int64_t> interleaver(unsigned K)
-{
-    const rules::BlockSize& row = *rules::findBlockSize(K);
-    Array<std::int64_t> positions(static_cast<py::ssize_t>(K));
-    for (std::uint64_t i = 0; i < K; ++i) {
-        positions.mutable_data()[i] = static_cast<std::int64_t>((row.f1 * i + row.f2 * i * i) % K);
-    }
-    return positions;
-}
-
-void pack(const std::uint8_t* bits, std::size_t count, std::uint64_t* words)
-{
-    for (std::size_t k = 0; k < count; ++k) {
-        words[k / 64] |= std::uint64_t{bits[k]} << k % 64;
-    }
-}
-
-void unpack(const std::uint64_t* words, std::size_t count, std::uint8_t* bits)
-{
-    for (std::size_t k = 0; k < count; ++k) {
-        bits[k] = words[k / 64] >> k % 64 & 1;
-    }
-}
-
-/// Encodes blocks of K bits, each 0 or 1, into the three streams of K + 4.
-py::tuple encode(const Array<std::uint8_t>& bits)
-{
-    using morvik::link::TurboEncoder;
-    const std::size_t blocks = sizeOf(bits.shape(0));
-    const std::size_t K = sizeOf(bits.shape(1));
-    std::array<Array<std::uint8_t>, 3> streams;
-    std::array<std::uint8_t*, 3> to{};
-    for (std::size_t s = 0; s < streams.size(); ++s) {
-        streams[s] = Array<std::uint8_t>({bits.shape(0), bits.shape(1) + morvik::rules::tailPositions});
-        to[s] = streams[s].mutable_data();
-    }
-    const std::uint8_t* from = bits.data();
-    {
-        const Unlocked unlocked;
-        TurboEncoder encoder(static_cast<unsigned>(K));
-        morvik::link::PackedBlocks information{encoder.words(), {}};
-        TurboEncoder::Streams encoded;
-        for (std::size_t done = 0; done < blocks; done += TurboEncoder::blocksAtOnce) {
-            const auto now = static_cast<unsigned>(std::min<std::size_t>(blocks - done, TurboEncoder::blocksAtOnce));
-            information.bits.assign(std::size_t{now} * information.words, 0);
-            for (unsigned b = 0; b < now; ++b) {
-                pack(from + (done + b) * K, K, information.block(b));
-            }
-            encoder.encode(information, now, encoded);
-            for (std::size_t s = 0; s < streams.size(); ++s) {
-                for (unsigned b = 0; b < now; ++b) {
-                    unpack(encoded[s].block(b),
-                           K + morvik::rules::tailPositions,
-                           to[s] + (done + b) * (K + morvik::rules::tailPositions));
-                }
-            }
-        }
-    }
-    return py::make_tuple(streams[0], streams[1], streams[2]);
-}
-
-void addLink(py::module_& module)
-{
-    py::tuple sizes(rules::blockSizes.size());
-    for (std::size_t i = 0; i < rules::blockSizes.size(); ++i) {
-        sizes[i] = rules::blockSizes[i].K;
-    }
-    module.attr("block_sizes") = sizes;
-    module.def("interleaver", interleaver, py::arg("block_size"));
-    module.def("encode", encode, py::arg("bits").noconvert());
-    module.def(
-        "noise_deviation",
-        [](unsigned K, int milliDecibels) {
-            return static_cast<double>(morvik::link::noiseDeviation(K, milliDecibels));
-        },
-        py::arg("block_size"),
-        py::arg("milli_decibels"));
-    module.def("default_scale",
-               morvik::link::defaultScale,
-               py::arg("algorithm"),
-               py::arg("block_size"),
-               py::arg("milli_decibels"));
 }
 
 // ---- Simulation
