@@ -2,108 +2,28 @@
 // variants decode the same received values, so their differences are far more exact than each rate.
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <array>
 #include <cmath>
 #include <cstdint>
 #include <cstdio>
 #include <exception>
 #include <iostream>
-#include <memory>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "VariantDecoder.h"
 #include "link/channel/Channel.h"
 #include "link/channel/DefaultScale.h"
 #include "link/coding/TurboEncoder.h"
 #include "link/random/GaussianNumber.h"
 #include "link/random/Random.h"
 #include "rules/Tail.h"
-#include "src/TDecoder3G.h"
 
 namespace {
 
 using namespace morvik::link;
-
-/// A decoder between the reference and the hardware. More than three fraction bits divide the step of the soft values.
-struct Variant {
-    const char* name;
-    std::size_t predecessor;  ///< the variant that differs by one step
-    const char* stateFormat;
-    const char* branchFormat;
-    const char* decoder;  ///< property string; empty: neither segments nor windows
-};
-
-/// The limit of the branch metrics is 64 in `fine`, 16 in all others. `hardware_N` is the model with N units.
-constexpr std::array<Variant, 7> variants = {{
-    {"fine", 0, "Fix_16_6", "Fix_13_6", ""},
-    {"clipped", 0, "Fix_16_6", "Fix_11_6", ""},
-    {"undivided", 1, "Fix_12_3", "Fix_8_3", ""},
-    {"windows", 2, "Fix_12_3", "Fix_8_3", "3GPPPU:1,1"},
-    {"hardware_2", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:2"},
-    {"hardware_4", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:4"},
-    {"hardware_8", 3, "Fix_12_3", "Fix_8_3", "3GPPPU:8"},
-}};
-
-/// Returns what a factory made; throws on failure.
-template <class Component>
-std::unique_ptr<Component> made(Component* component)
-{
-    if (component == nullptr) {
-        throw std::runtime_error("a component cannot be made");
-    }
-    return std::unique_ptr<Component>(component);
-}
-
-class VariantDecoder {
-public:
-    VariantDecoder(const Variant& variant, int algorithm)
-        : itsState(made(TNumberFormat::create(variant.stateFormat))),
-          itsBranch(made(TNumberFormat::create(variant.branchFormat))),
-          itsInterleaver(made(TInterleaver::create("3GPPLTE"))),
-          itsEngine(made(TCalculationEngine::create(algorithm == 2 ? "MOD#:16" : "MOD"))),
-          itsDecoder(made(*variant.decoder == '\0' ? TDecoder3G::create(false, "") : TDecoder::create(variant.decoder)))
-    {
-        itsEngine->itsStateFormat = itsState.get();
-        itsEngine->itsBranchFormat = itsEngine->itsInputFormat = itsBranch.get();
-        if (!itsEngine->initialise()) {
-            throw std::runtime_error("the engine cannot be initialised");
-        }
-        itsDecoder->itsInterleaver = itsInterleaver.get();
-        itsDecoder->itsEngine = itsEngine.get();
-        itsDecoder->itsExtrinsicScale = algorithm == 1 ? 0.75 : 1.0;
-    }
-
-    /// Whether the received block, in units of the transmitted amplitude, decodes without an error. `scale` is in steps
-    /// of the hardware's soft values, eighths.
-    bool decodes(const std::vector<double>& received,
-                 double scale,
-                 unsigned iterations,
-                 const std::vector<unsigned char>& sent)
-    {
-        const double steps = scale * itsState->itsScale / 8;
-        itsSoft.clear();
-        for (const double value : received) {
-            const double rounded = std::round(value * steps);
-            const double lowest = itsBranch->itsMinQ;
-            const double highest = itsBranch->itsMaxQ;
-            itsSoft.push_back(itsState->place(static_cast<std::int32_t>(std::clamp(rounded, lowest, highest))));
-        }
-        if (!itsDecoder->decode(itsSoft, itsHard, iterations)) {
-            throw std::runtime_error("a block was refused");
-        }
-        return itsHard == sent;
-    }
-
-private:
-    std::unique_ptr<TNumberFormat> itsState;
-    std::unique_ptr<TNumberFormat> itsBranch;
-    std::unique_ptr<TInterleaver> itsInterleaver;
-    std::unique_ptr<TCalculationEngine> itsEngine;
-    std::unique_ptr<TDecoder> itsDecoder;
-    std::vector<short> itsSoft;
-    std::vector<unsigned char> itsHard;
-};
+using morvik::validation::Variant;
+using morvik::validation::VariantDecoder;
+using morvik::validation::variants;
 
 /// Received blocks of random bits, from seed 1.
 class ReceivedBlocks {
@@ -223,7 +143,7 @@ void simulatePoint(const Options& options, int milliDecibels)
     for (; count < options.maxBlocks && errors[0] < options.blockErrors; ++count) {
         blocks.make(count);
         for (std::size_t i = 0; i < decoders.size(); ++i) {
-            failed[i] = !decoders[i].decodes(blocks.received, scale, options.iterations, blocks.sent);
+            failed[i] = decoders[i].decode(blocks.received, scale, options.iterations) != blocks.sent;
             errors[i] += failed[i] ? 1U : 0U;
             disagreements[i] += failed[i] != failed[predecessors[i]] ? 1U : 0U;
         }
