@@ -13,6 +13,7 @@
 #include "Decoder.h"
 #include "ErrorRates.h"
 #include "Link.h"
+#include "Lte.h"
 #include "base/Error.h"
 #include "base/Thousandths.h"
 #include "rules/Tail.h"
@@ -251,6 +252,7 @@ PYBIND11_MODULE(_core, module)
     }
     addDecoder(module);
     addLink(module);
+    addLte(module);
     addSimulation(module);
 }
 #undef PyInit__core

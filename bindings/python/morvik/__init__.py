@@ -16,6 +16,7 @@ from morvik import _core
 
 _core.expect_main_interpreter()  # an import does not check this again for a module that is already loaded
 
+from morvik import lte
 from morvik._core import __version__
 from morvik._decoder import Decoded, Decoder, instruction_sets
 from morvik._errors import DecoderWarning, Error
@@ -35,4 +36,5 @@ __all__ = [
     "error_rate",
     "instruction_sets",
     "interleaver",
+    "lte",
 ]

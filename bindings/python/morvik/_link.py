@@ -57,7 +57,7 @@ def encode(bits: npt.ArrayLike) -> Streams:
     The bits are integers 0 and 1 or booleans. The streams are uint8 of shape (K + 4,) or (n, K + 4), each element 0
     or 1.
     """
-    array = _bits("bits", bits)
+    array = bits_of("bits", bits)
     _block_size(array.shape[-1])
     streams = _core.encode(np.ascontiguousarray(array.reshape(-1, array.shape[-1])))
     return Streams(*(stream.reshape(*array.shape[:-1], stream.shape[-1]) for stream in streams))
@@ -89,7 +89,7 @@ def awgn(
     a call follows from 64 bits that it takes from the generator, and is the same on every machine; as in
     :func:`error_rate`, soft values are drawn from their exact distribution.
     """
-    arrays = [_bits(name, stream) for name, stream in zip(Streams._fields, _three(streams))]
+    arrays = [bits_of(name, stream) for name, stream in zip(Streams._fields, three_streams(streams))]
     positions = arrays[0].shape[-1]
     expect_block("sys", positions)
     milli_decibels = ebn0_thousandths(ebn0_db)
@@ -107,7 +107,7 @@ def awgn(
 _block_size = block_size  # under a name that no parameter shadows
 
 
-def _three(streams: Any) -> tuple[Any, ...]:
+def three_streams(streams: Any) -> tuple[Any, ...]:
     expect_unmasked("streams", streams)
     three = tuple(streams)
     if len(three) != 3 or len({np.shape(stream) for stream in three}) != 1:
@@ -115,7 +115,7 @@ def _three(streams: Any) -> tuple[Any, ...]:
     return three
 
 
-def _bits(name: str, values: npt.ArrayLike) -> npt.NDArray[np.uint8]:
+def bits_of(name: str, values: npt.ArrayLike) -> npt.NDArray[np.uint8]:
     """The values as an array of 0 and 1."""
     array = plain_array(name, values)
     if array.dtype.kind not in "iub":

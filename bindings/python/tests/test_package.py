@@ -33,7 +33,7 @@ def test_stubs_tell_what_the_module_has(tmp_path):
     config = tmp_path / "mypy.ini"
     config.write_text(f"[mypy]\ncache_dir = {tmp_path}\n")
     metaclasses = tmp_path / "metaclasses"  # pybind11 has one of its own
-    metaclasses.write_text("".join(f"morvik._core.{name}\n" for name in ("Decoder", "StopRules", "Sweep")))
+    metaclasses.write_text("".join(f"morvik._core.{name}\n" for name in ("Decoder", "StopRules", "Sweep", "Transport")))
     options = ["--ignore-positional-only", "--mypy-config-file", str(config), "--allowlist", str(metaclasses)]
     run("-m", "mypy.stubtest", *options, "morvik._core")
 
@@ -60,13 +60,18 @@ def test_everything_has_a_docstring():
         value = getattr(morvik, name)
         if inspect.isclass(value) or inspect.isfunction(value):
             assert inspect.getdoc(value), name
-    for name, member in inspect.getmembers(morvik.Decoder):
-        if not name.startswith("_"):
-            assert inspect.getdoc(member), name
+    for name in morvik.lte.__all__:
+        assert inspect.getdoc(getattr(morvik.lte, name)), name
+    for kind in (morvik.Decoder, morvik.lte.Transport):
+        for name, member in inspect.getmembers(kind):
+            if not name.startswith("_"):
+                assert inspect.getdoc(member), name
 
 
 def test_example_of_the_docstring():
     assert doctest.testmod(morvik).failed == 0
+    tested = doctest.testmod(morvik.lte)
+    assert tested.failed == 0 and tested.attempted > 0
 
 
 def test_version_is_that_of_the_project(repository):

@@ -1,0 +1,607 @@
+"""The LTE chain around the core: transport blocks, rate matching, modulation, and their reverse.
+
+>>> import numpy as np
+>>> from morvik import Decoder, lte
+>>> rng = np.random.default_rng(1)
+>>> chain = lte.Transport(1000, 2400, "16qam")          # 1000 bits, sent as 2400
+>>> bits = rng.integers(0, 2, (100, 1000))              # 100 transport blocks
+>>> symbols = lte.map(chain.encode(bits), "16qam")      # complex64 of shape (100, 600), with mean energy 1
+>>> noise = rng.normal(0, 0.35 / 2**0.5, (*symbols.shape, 2)).astype("f4").view("c8")[..., 0]
+>>> llrs = lte.demap(symbols + noise, "16qam", 0.35**2)
+>>> received = chain.decode(Decoder(), chain.recover(llrs))
+>>> bool(received.fits.all()), bool((received.bits == bits).all())
+(True, True)
+
+The chain is that of 3GPP TS 36.212, clauses 5.1.1 to 5.1.5, and TS 36.211, clauses 7.1.2 to 7.1.5. Log-likelihood
+ratios are ln(P(1) / P(0)), as float32: positive where a 1 is likelier. Every array has one dimension for one block, or
+a leading one for n blocks.
+"""
+
+from __future__ import annotations
+
+import math
+from typing import Any, NamedTuple
+
+import numpy as np
+import numpy.typing as npt
+
+from morvik import _core
+from morvik._arguments import (
+    DEFAULT_ITERATIONS,
+    block_size as checked_block_size,
+    expect_block,
+    expect_unmasked,
+    integer,
+    plain_array,
+    real,
+)
+from morvik._decoder import Decoder
+from morvik._errors import Error
+from morvik._link import Streams, bits_of, three_streams
+
+__all__ = [
+    "DEFAULT_SCALE",
+    "CodeBlock",
+    "CodeBlocks",
+    "Received",
+    "Transport",
+    "crc24a",
+    "crc24b",
+    "deinterleave",
+    "demap",
+    "map",
+    "rate_match",
+    "rate_recover",
+    "segment",
+    "soft_values",
+]
+
+DEFAULT_SCALE = 8.0
+"""Steps of a soft value for a log-likelihood ratio of 1."""
+
+_BITS_PER_SYMBOL = {"bpsk": 1, "qpsk": 2, "16qam": 4, "64qam": 6, "256qam": 8}
+_DEMAPPERS = ("max-log", "exact")
+_CRC_BITS = 24
+_FILLER = -128  # the core's strongest 0
+_MOST = 2**32 - 1
+
+
+class CodeBlocks(NamedTuple):
+    """How a transport block is divided: 3GPP TS 36.212, clause 5.1.2. The first ``count_minus`` code blocks have
+    ``size_minus`` bits, the others ``size_plus``."""
+
+    number: int
+    """Code blocks (C)."""
+    fillers: int
+    """Filler bits at the start of the first one (F)."""
+    size_plus: int
+    """Bits of a larger code block (K+)."""
+    count_plus: int
+    """How many there are (C+)."""
+    size_minus: int
+    """Bits of a smaller one (K-), or 0."""
+    count_minus: int
+    """How many there are (C-)."""
+
+
+class CodeBlock(NamedTuple):
+    """Where a code block of a transport block lies."""
+
+    size: int
+    """Its bits (K)."""
+    fillers: int
+    """Filler bits at its start."""
+    payload: int
+    """Bits of the transport block and its CRC that it carries."""
+    payload_at: int
+    """The first of them."""
+    coded_bits: int
+    """Its bits in a transmission (E)."""
+    coded_at: int
+    """The first of them."""
+    buffer_size: int
+    """Its values in the soft buffer."""
+    buffer_at: int
+    """The first of them."""
+
+
+class Received(NamedTuple):
+    """The result of :meth:`Transport.decode`. For n transport blocks, arrays have a leading dimension n."""
+
+    bits: npt.NDArray[np.uint8]
+    """Decisions on the transport block, each 0 or 1: uint8 of shape (A,) or (n, A)."""
+
+    fits: npt.NDArray[np.bool_]
+    """Whether all CRCs fit, of the transport block and its code blocks: bool of shape () or (n,)."""
+
+    code_blocks_fit: npt.NDArray[np.bool_]
+    """Whether the CRC of each code block fits: bool of shape (C,) or (n, C). A single one has that of the transport
+    block."""
+
+
+# ---- Steps
+
+
+def crc24a(bits: npt.ArrayLike) -> npt.NDArray[np.uint8]:
+    """The 24 parity bits of transport blocks, gCRC24A of TS 36.212, clause 5.1.1: bits of shape (A,) or (n, A) give
+    uint8 of shape (24,) or (n, 24). Over bits with their parity behind them, all are 0."""
+    return _crc(bits, False)
+
+
+def crc24b(bits: npt.ArrayLike) -> npt.NDArray[np.uint8]:
+    """The same with gCRC24B, for the code blocks of a transport block that has several."""
+    return _crc(bits, True)
+
+
+def segment(transport_block_size: int) -> CodeBlocks:
+    """How a transport block of so many bits, without their CRC, is divided into code blocks."""
+    return CodeBlocks(*_core.segment(_transport_block_size(transport_block_size)))
+
+
+def rate_match(
+    streams: Streams | tuple[npt.ArrayLike, npt.ArrayLike, npt.ArrayLike],
+    coded_bits: int,
+    version: int = 0,
+    *,
+    fillers: int = 0,
+    buffer_size: int | None = None,
+) -> npt.NDArray[np.uint8]:
+    """Rate matching of code blocks: 3GPP TS 36.212, clause 5.1.4.1.
+
+    ``streams``
+        What :func:`morvik.encode` returns.
+    ``coded_bits``
+        Bits to send of each block (E).
+    ``version``
+        Redundancy version, 0 to 3.
+    ``fillers``
+        Filler bits at the start of each block (F); they are not sent.
+    ``buffer_size``
+        Positions of the circular buffer (N_cb), its dummy and filler bits included; None for all.
+
+    Returns uint8 of shape (E,) or (n, E).
+    """
+    arrays = [bits_of(name, stream) for name, stream in zip(Streams._fields, three_streams(streams))]
+    positions = arrays[0].shape[-1]
+    expect_block("streams", positions)
+    matching = _matching(positions - 4, fillers, buffer_size)
+    rows = [np.ascontiguousarray(array.reshape(-1, positions)) for array in arrays]
+    count = integer("coded_bits", coded_bits, 0, _MOST)
+    return _core.rate_match(matching, _version(version), rows, count).reshape(*arrays[0].shape[:-1], count)
+
+
+def rate_recover(
+    llrs: npt.ArrayLike,
+    block_size: int,
+    version: int = 0,
+    *,
+    fillers: int = 0,
+    buffer_size: int | None = None,
+    buffers: npt.NDArray[Any] | None = None,
+    width: int | None = None,
+) -> npt.NDArray[Any]:
+    """Rate recovery of code blocks: adds the ratios of a transmission to soft buffers.
+
+    ``llrs``
+        Ratios of shape (E,) or (n, E); with ``width``, whole steps as :func:`soft_values` gives them.
+    ``block_size``
+        K.
+    ``version``, ``fillers``, ``buffer_size``
+        As for :func:`rate_match`.
+    ``buffers``
+        What earlier transmissions left; None before the first one. It is not changed.
+    ``width``
+        Bits of a soft buffer's values, 2 to 16: each sum is clipped to them. None adds in floating point.
+
+    Returns the soft buffers, in the order of the circular buffer, without its dummy and filler bits: float32, or int16
+    with ``width``.
+    """
+    matching = _matching(block_size, fillers, buffer_size)
+    array = _received(llrs, width)
+    received = _rows(array)
+    sums = _sums(buffers, (*array.shape[:-1], _core.soft_buffer_size(matching)), array.dtype)
+    if width is None:
+        _core.rate_recover(matching, _version(version), received, sums)
+    else:
+        _core.rate_recover_steps(matching, _version(version), received, _width(width), sums)
+    return sums.reshape(*array.shape[:-1], -1)
+
+
+def deinterleave(
+    buffers: npt.ArrayLike,
+    block_size: int,
+    *,
+    fillers: int = 0,
+    buffer_size: int | None = None,
+    filler: float = _FILLER,
+) -> Streams:
+    """Puts the values of soft buffers into the three streams of a decoder.
+
+    ``buffers``
+        Soft values, int8, or ratios; of shape (S,) or (n, S), as from :func:`rate_recover`.
+    ``filler``
+        The value of filler bits in ``sys`` and ``par1``. Both sides know that they are 0.
+
+    What was not sent and lies outside of the buffer becomes 0. Returns int8 or float32 of shape (K + 4,) or (n, K + 4).
+    """
+    matching = _matching(block_size, fillers, buffer_size)
+    size = _core.soft_buffer_size(matching)
+    array = plain_array("buffers", buffers)
+    if array.dtype != np.int8:
+        array = _ratios(array, "buffers")
+    if array.shape[-1] != size:
+        raise ValueError(f"buffers must have {size} values for each block, not {array.shape[-1]}")
+    streams: list[npt.NDArray[Any]]
+    if array.dtype == np.int8:
+        streams = _core.deinterleave_steps(matching, _rows(array), integer("filler", filler, -128, 127))
+    else:
+        streams = _core.deinterleave(matching, _rows(array), real("filler", filler))
+    return Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams))
+
+
+def soft_values(llrs: npt.ArrayLike, scale: float = DEFAULT_SCALE, width: int = 8) -> npt.NDArray[Any]:
+    """Turns log-likelihood ratios, of any shape, into soft values: times ``scale``, rounded with halves away from 0, and
+    clipped to ``width`` bits.
+
+    With 8 bits, int8, they are what :meth:`morvik.Decoder.decode` takes. Other widths, 2 to 16, are int16, for soft
+    buffers of this width. Ratios must be finite.
+    """
+    array = _ratios(llrs)
+    steps = _positive("scale", scale)
+    flat = np.ascontiguousarray(array.reshape(-1))
+    values: npt.NDArray[Any]
+    if _width(width) == 8:
+        values = _core.soft_values(flat, steps)
+    else:
+        values = _core.soft_steps(flat, steps, width)
+    return values.reshape(array.shape)
+
+
+# ---- Modulation
+
+
+def map(bits: npt.ArrayLike, modulation: str = "qpsk") -> npt.NDArray[Any]:
+    """Maps bits to symbols of mean energy 1: 3GPP TS 36.211, clauses 7.1.2 to 7.1.5.
+
+    ``modulation``
+        ``"qpsk"``, ``"16qam"``, ``"64qam"`` or ``"256qam"``, which give complex64; or ``"bpsk"`` of one dimension, which
+        sends 1 as +1 and 0 as -1 and gives float32.
+    """
+    count = bits_per_symbol(modulation)
+    array = bits_of("bits", bits)
+    if array.shape[-1] % count != 0:
+        raise ValueError(f"bits must be a multiple of the {count} of a {modulation} symbol, not {array.shape[-1]}")
+    symbols = _core.map(count, np.ascontiguousarray(array.reshape(-1)))
+    return _as_symbols(symbols, count).reshape(*array.shape[:-1], array.shape[-1] // count)
+
+
+def demap(
+    symbols: npt.ArrayLike,
+    modulation: str,
+    noise_variance: float,
+    *,
+    gains: npt.ArrayLike | None = None,
+    demapper: str = "max-log",
+) -> npt.NDArray[np.float32]:
+    """The log-likelihood ratios of the bits of received symbols, gain * symbol + noise.
+
+    ``symbols``
+        Of any shape; complex, their phase already turned back, or real for ``"bpsk"``.
+    ``modulation``
+        As for :func:`map`.
+    ``noise_variance``
+        Of I and Q together (N0), above 0; the one dimension of BPSK has half of it. Where it differs, divide each
+        symbol and its gain by the noise's deviation, and give 1.
+    ``gains``
+        The channel's amplitude at each symbol, at least 0, of the same shape; None: all are 1.
+    ``demapper``
+        ``"max-log"``, by the nearest points alone, or ``"exact"``, by all points.
+
+    Returns float32: the last dimension is longer by the bits of a symbol.
+    """
+    count = bits_per_symbol(modulation)
+    array = plain_array("symbols", symbols)
+    if array.dtype.kind not in ("iuf" if count == 1 else "iufc") or array.ndim == 0:
+        raise TypeError(f"symbols must be an array of {'real' if count == 1 else 'complex'} numbers, not {array.dtype}")
+    if not np.isfinite(array).all():
+        raise ValueError("symbols must be finite")
+    if demapper not in _DEMAPPERS:
+        raise ValueError(f"demapper must be one of {', '.join(_DEMAPPERS)}, not {demapper!r}")
+    amplitudes = None if gains is None else _gains(gains, array.shape)
+    flat = np.ascontiguousarray(array.reshape(-1).astype(np.float32 if count == 1 else np.complex64, copy=False))
+    llrs = _core.demap(
+        count, _DEMAPPERS.index(demapper), flat.view(np.float32), amplitudes, _positive("noise_variance", noise_variance)
+    )
+    return llrs.reshape(*array.shape[:-1], array.shape[-1] * count)
+
+
+def bits_per_symbol(modulation: str) -> int:
+    """The bits of a symbol (Q_m)."""
+    if modulation not in _BITS_PER_SYMBOL:
+        raise ValueError(f"modulation must be one of {', '.join(_BITS_PER_SYMBOL)}, not {modulation!r}")
+    return _BITS_PER_SYMBOL[modulation]
+
+
+# ---- Transport blocks
+
+
+class Transport:
+    """A transmitter and receiver of transport blocks of one format.
+
+    ``transport_block_size``
+        Bits of a transport block, without its CRC (A).
+    ``coded_bits``
+        Bits of one transmission (G).
+    ``modulation``
+        As for :func:`map`.
+    ``layers``
+        1 to 4 (N_L).
+    ``soft_buffer_size``
+        Positions of the soft buffer for a transport block (N_IR); None for all.
+    """
+
+    def __init__(
+        self,
+        transport_block_size: int,
+        coded_bits: int,
+        modulation: str = "qpsk",
+        *,
+        layers: int = 1,
+        soft_buffer_size: int | None = None,
+    ) -> None:
+        self._size = _transport_block_size(transport_block_size)
+        self._coded_bits = integer("coded_bits", coded_bits, 1, _MOST)
+        self._modulation = modulation
+        self._code_blocks = segment(self._size)
+        self._layers = integer("layers", layers, 1, 4)
+        self._expect_symbols()
+        positions = 0 if soft_buffer_size is None else integer("soft_buffer_size", soft_buffer_size, 1, _MOST)
+        try:
+            self._core = _core.Transport(
+                self._size, self._coded_bits, bits_per_symbol(modulation), self._layers, positions
+            )
+        except Error as error:
+            raise Error(
+                f"{error} (transport_block_size={transport_block_size!r}, soft_buffer_size={soft_buffer_size!r})"
+            ) from None
+
+    def encode(self, bits: npt.ArrayLike, version: int = 0) -> npt.NDArray[np.uint8]:
+        """The coded bits of one transmission with a redundancy version, 0 to 3: bits of shape (A,) or (n, A) give uint8
+        of shape (G,) or (n, G)."""
+        array = bits_of("bits", bits)
+        self._expect_columns("bits", array, self._size)
+        coded = self._core.encode(_version(version), np.ascontiguousarray(array.reshape(-1, self._size)))
+        return coded.reshape(*array.shape[:-1], self._coded_bits)
+
+    def recover(
+        self,
+        llrs: npt.ArrayLike,
+        version: int = 0,
+        buffers: npt.NDArray[Any] | None = None,
+        *,
+        width: int | None = None,
+    ) -> npt.NDArray[Any]:
+        """Adds the ratios of a transmission, of shape (G,) or (n, G), to soft buffers.
+
+        ``buffers``
+            What earlier transmissions left; None before the first one. It is not changed.
+        ``width``
+            Bits of a soft buffer's values, 2 to 16: ``llrs`` are then whole steps, as :func:`soft_values` gives them
+            with this width, and each sum is clipped to it. None adds in floating point.
+
+        Returns the soft buffers: float32, or int16 with ``width``.
+        """
+        array = _received(llrs, width)
+        self._expect_columns("llrs", array, self._coded_bits)
+        received = _rows(array)
+        sums = _sums(buffers, (*array.shape[:-1], self._core.buffer_size), array.dtype)
+        if width is None:
+            self._core.recover(_version(version), received, sums)
+        else:
+            self._core.recover_steps(_version(version), received, _width(width), sums)
+        return sums.reshape(*array.shape[:-1], -1)
+
+    def soft_values(self, buffers: npt.ArrayLike, scale: float | None = None) -> list[Streams]:
+        """The soft values of each code block, for :meth:`morvik.Decoder.decode`: int8 of shape (K + 4,) or (n, K + 4).
+
+        ``buffers``
+            What :meth:`recover` returns. Those of whole steps are only clipped.
+        ``scale``
+            Steps for a ratio of 1; :data:`DEFAULT_SCALE` when None.
+        """
+        array = plain_array("buffers", buffers)
+        is_steps = array.dtype == np.int16
+        if is_steps and scale is not None:
+            raise ValueError("scale must be None for buffers of whole steps, which were scaled before")
+        if not is_steps:
+            array = _ratios(array, "buffers")
+        self._expect_columns("buffers", array, self._core.buffer_size)
+        rows = _rows(array)
+        steps = DEFAULT_SCALE if scale is None else _positive("scale", scale)
+        blocks = (
+            self._core.soft_values_of_steps(r, rows) if is_steps else self._core.soft_values(r, rows, steps)
+            for r in range(self._code_blocks.number)
+        )
+        return [Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams)) for streams in blocks]
+
+    def join(self, decisions: list[npt.NDArray[np.uint8]]) -> Received:
+        """Puts the decisions on all code blocks together, each of shape (K,) or (n, K), and checks their CRCs."""
+        if len(decisions) != self._code_blocks.number:
+            raise ValueError(f"decisions must have {self._code_blocks.number} code blocks, not {len(decisions)}")
+        arrays = [bits_of("decisions", array) for array in decisions]
+        shape = arrays[0].shape[:-1]
+        bits = np.zeros((math.prod(shape), self._size + _CRC_BITS), np.uint8)
+        fits = np.empty((self._code_blocks.number, len(bits)), np.uint8)
+        for r, array in enumerate(arrays):
+            self._expect_columns("decisions", array, self.code_block(r).size)
+            if array.shape[:-1] != shape:
+                raise ValueError("decisions must have as many blocks for each code block")
+            fits[r] = self._core.join(r, np.ascontiguousarray(array.reshape(-1, array.shape[-1])), bits)
+        every = self._core.check(bits) & fits.min(axis=0)
+        return Received(
+            bits[:, : self._size].reshape(*shape, self._size),
+            every.astype(np.bool_).reshape(shape),
+            fits.T.astype(np.bool_).reshape(*shape, -1),
+        )
+
+    def decode(
+        self,
+        decoder: Decoder,
+        buffers: npt.ArrayLike,
+        iterations: int = DEFAULT_ITERATIONS,
+        *,
+        scale: float | None = None,
+    ) -> Received:
+        """Decodes soft buffers: :meth:`soft_values`, the decoder for all code blocks of one size at once, and
+        :meth:`join`."""
+        blocks = self.soft_values(buffers, scale)
+        shape = blocks[0].sys.shape[:-1]
+        decisions: list[npt.NDArray[np.uint8]] = []
+        sizes = (self._code_blocks.size_minus, self._code_blocks.size_plus)
+        for size, count in zip(sizes, (self._code_blocks.count_minus, self._code_blocks.count_plus)):
+            alike = [block for block in blocks if block.sys.shape[-1] == size + 4]
+            if count > 0:
+                sys, par1, par2 = (np.concatenate([block[s].reshape(-1, size + 4) for block in alike]) for s in range(3))
+                bits = decoder.decode(sys, par1, par2, iterations).bits
+                decisions += list(bits.reshape(count, *shape, size))
+        return self.join(decisions)
+
+    @property
+    def transport_block_size(self) -> int:
+        """Bits of a transport block, without its CRC (A)."""
+        return self._size
+
+    @property
+    def coded_bits(self) -> int:
+        """Bits of one transmission (G)."""
+        return self._coded_bits
+
+    @property
+    def modulation(self) -> str:
+        """The modulation."""
+        return self._modulation
+
+    @property
+    def code_blocks(self) -> CodeBlocks:
+        """How a transport block is divided."""
+        return self._code_blocks
+
+    def code_block(self, r: int) -> CodeBlock:
+        """Where code block r lies, 0 and up."""
+        return CodeBlock(*self._core.code_block(integer("r", r, 0, self._code_blocks.number - 1)))
+
+    def __repr__(self) -> str:
+        return f"morvik.lte.Transport({self._size}, {self._coded_bits}, {self._modulation!r})"
+
+    def _expect_symbols(self) -> None:
+        symbol = bits_per_symbol(self._modulation) * self._layers
+        least = symbol * self._code_blocks.number
+        if self._coded_bits % symbol != 0 or self._coded_bits < least:
+            below = max(self._coded_bits // symbol * symbol, least)
+            raise ValueError(
+                f"coded_bits must be a multiple of the {symbol} bits of a symbol, at least {least} for "
+                f"{self._code_blocks.number} code blocks, not {self._coded_bits}; {below} would fit"
+            )
+
+    @staticmethod
+    def _expect_columns(name: str, array: npt.NDArray[Any], columns: int) -> None:
+        if array.shape[-1] != columns:
+            raise ValueError(f"{name} must have {columns} values for each block, not {array.shape[-1]}")
+
+
+# ---- Arguments
+
+
+def _crc(bits: npt.ArrayLike, is_of_code_block: bool) -> npt.NDArray[np.uint8]:
+    array = bits_of("bits", bits)
+    parity = _core.crc(np.ascontiguousarray(array.reshape(-1, array.shape[-1])), is_of_code_block)
+    return parity.reshape(*array.shape[:-1], _CRC_BITS)
+
+
+def _transport_block_size(value: Any) -> int:
+    return integer("transport_block_size", value, 1, 2**24)
+
+
+def _matching(block_size: Any, fillers: Any, buffer_size: Any) -> tuple[int, int, int]:
+    size = checked_block_size(block_size)
+    positions = 0 if buffer_size is None else integer("buffer_size", buffer_size, 1, _MOST)
+    matching = (size, integer("fillers", fillers, 0, size - 1), positions)
+    try:
+        _core.soft_buffer_size(matching)
+    except Error as error:
+        raise Error(f"{error} (block_size={size}, fillers={fillers!r}, buffer_size={buffer_size!r})") from None
+    return matching
+
+
+def _version(value: Any) -> int:
+    return integer("version", value, 0, 3)
+
+
+def _width(value: Any) -> int:
+    return integer("width", value, 2, 16)
+
+
+def _positive(name: str, value: Any) -> float:
+    number = real(name, value)
+    if not 0 < number < 3e38 or np.float32(number) == 0:
+        raise ValueError(f"{name} must be a positive number that float32 holds, not {value!r}")
+    return number
+
+
+def _ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.float32]:
+    """The values as float32 in C order, finite."""
+    array = plain_array(name, values)
+    if array.dtype.kind not in "fiu":
+        raise TypeError(f"{name} must hold real numbers, not {array.dtype}")
+    if array.ndim == 0:
+        raise ValueError(f"{name} must be an array, not a number")
+    wrong = np.argwhere(~np.isfinite(array))
+    if len(wrong) > 0:
+        place = ", ".join(str(index) for index in wrong[0])
+        raise ValueError(f"{name} must be finite, but [{place}] is {array[tuple(wrong[0])]}")
+    return np.ascontiguousarray(array, np.float32)
+
+
+def _steps(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
+    array = plain_array(name, values)
+    if array.dtype not in (np.int8, np.int16):
+        raise TypeError(f"{name} must hold whole steps, as int8 or int16, with a width, not {array.dtype}")
+    if array.ndim == 0:
+        raise ValueError(f"{name} must be an array, not a number")
+    return np.ascontiguousarray(array, np.int16)
+
+
+def _received(llrs: npt.ArrayLike, width: int | None) -> npt.NDArray[Any]:
+    if width is None:
+        return _ratios(llrs)
+    return _steps("llrs", llrs)
+
+
+def _rows(array: npt.NDArray[Any]) -> npt.NDArray[Any]:
+    if array.ndim > 2:
+        raise ValueError(f"arrays must have one or two dimensions, not {array.ndim}")
+    return array.reshape(-1, array.shape[-1])
+
+
+def _sums(buffers: Any, shape: tuple[int, ...], dtype: Any) -> npt.NDArray[Any]:
+    """A copy of the soft buffers as rows, or zeros."""
+    if buffers is None:
+        return np.zeros(shape, dtype).reshape(-1, shape[-1])
+    expect_unmasked("buffers", buffers)
+    array = np.asarray(buffers)
+    if array.shape != shape or array.dtype != dtype:
+        raise ValueError(f"buffers must be {dtype} of shape {shape}, not {array.dtype} of shape {array.shape}")
+    return np.array(array, order="C").reshape(-1, shape[-1])
+
+
+def _gains(gains: npt.ArrayLike, shape: tuple[int, ...]) -> npt.NDArray[np.float32]:
+    array = _ratios(gains, "gains")
+    if array.shape != shape:
+        raise ValueError(f"gains must have the shape of symbols, {shape}, not {array.shape}")
+    if array.size > 0 and array.min() < 0:
+        raise ValueError("gains must be at least 0: the phase of symbols is turned back before")
+    return array.reshape(-1)
+
+
+def _as_symbols(numbers: npt.NDArray[np.float32], bits: int) -> npt.NDArray[Any]:
+    return numbers if bits == 1 else numbers.view(np.complex64)
