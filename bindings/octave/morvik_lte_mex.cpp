@@ -1,0 +1,374 @@
+// morvik_lte_mex: what the functions morvik_lte_*.m call: the chain of include/morvik_link.h. Octave and MATLAB build
+// it alike.
+//
+//     [status, text, ...] = morvik_lte_mex(command, ...)
+//
+// A block is a column. The callers have checked classes and sizes: bits are logical, ratios, symbols, soft buffers and
+// gains single, all numbers whole and within 32 bits where they count something. They also raise errors, from the
+// status of the C interface: an interpreter's functions for it would leave without destroying anything.
+#include <mex.h>
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <exception>
+#include <memory>
+#include <vector>
+
+#include "morvik_link.h"
+
+namespace {
+
+constexpr std::size_t tailPositions = 4;
+constexpr std::size_t parityBits = 24;
+
+/// The elements; of an empty array, a place that nobody looks at, as the library wants no null pointers.
+template <class Value>
+Value* data(const mxArray* array)
+{
+    static double none = 0;
+    void* const elements = mxGetData(array);
+    return static_cast<Value*>(elements != nullptr ? elements : &none);
+}
+
+std::uint8_t* bits(const mxArray* array)
+{
+    return data<std::uint8_t>(array);
+}
+
+/// A whole number of a vector of doubles.
+std::uint32_t whole(const mxArray* numbers, std::size_t index = 0)
+{
+    return static_cast<std::uint32_t>(data<const double>(numbers)[index]);
+}
+
+float real(const mxArray* number)
+{
+    return static_cast<float>(*data<const double>(number));
+}
+
+mxArray* logicalMatrix(std::size_t rows, std::size_t columns)
+{
+    return mxCreateLogicalMatrix(static_cast<mwSize>(rows), static_cast<mwSize>(columns));
+}
+
+mxArray* numericMatrix(std::size_t rows, std::size_t columns, mxClassID type)
+{
+    return mxCreateNumericMatrix(static_cast<mwSize>(rows), static_cast<mwSize>(columns), type, mxREAL);
+}
+
+using Results = mxArray**;
+using Arguments = const mxArray* const*;
+
+// ---- Steps
+
+/// bits, whether with gCRC24B -> parity
+std::int32_t crc(Results results, Arguments arguments)
+{
+    const std::size_t count = mxGetM(arguments[0]);
+    const std::size_t blocks = mxGetN(arguments[0]);
+    const auto function = whole(arguments[1]) != 0 ? morvik_link_crc24b : morvik_link_crc24a;
+    results[0] = logicalMatrix(parityBits, blocks);
+    for (std::size_t b = 0; b < blocks; ++b) {
+        function(bits(arguments[0]) + b * count, count, bits(results[0]) + b * parityBits);
+    }
+    return MORVIK_LINK_OK;
+}
+
+/// transport block size -> count, fillers, size_plus, count_plus, size_minus, count_minus
+std::int32_t segment(Results results, Arguments arguments)
+{
+    morvik_link_code_blocks blocks{};
+    const std::int32_t status = morvik_link_segment(whole(arguments[0]), &blocks);
+    const std::array numbers = {
+        blocks.count, blocks.fillers, blocks.size_plus, blocks.count_plus, blocks.size_minus, blocks.count_minus};
+    results[0] = numericMatrix(1, numbers.size(), mxDOUBLE_CLASS);
+    std::copy(numbers.begin(), numbers.end(), data<double>(results[0]));
+    return status;
+}
+
+/// Rate matching of code blocks is described by K, filler bits, positions of the circular buffer, redundancy version.
+struct Matching {
+    explicit Matching(const mxArray* numbers)
+        : K(whole(numbers)), fillers(whole(numbers, 1)), size(whole(numbers, 2)), version(whole(numbers, 3))
+    {
+    }
+
+    std::uint32_t K;
+    std::uint32_t fillers;
+    std::uint32_t size;
+    std::uint32_t version;
+};
+
+/// matching, sys, par1, par2, count -> coded bits
+std::int32_t rateMatch(Results results, Arguments arguments)
+{
+    const Matching of(arguments[0]);
+    const std::size_t blocks = mxGetN(arguments[1]);
+    const std::size_t count = whole(arguments[4]);
+    results[0] = logicalMatrix(count, blocks);
+    return morvik_link_rate_match(of.K,
+                                  of.fillers,
+                                  of.size,
+                                  of.version,
+                                  blocks,
+                                  bits(arguments[1]),
+                                  bits(arguments[2]),
+                                  bits(arguments[3]),
+                                  count,
+                                  bits(results[0]));
+}
+
+/// matching, ratios, soft buffers or nothing -> soft buffers
+std::int32_t rateRecover(Results results, Arguments arguments)
+{
+    const Matching of(arguments[0]);
+    const std::size_t blocks = mxGetN(arguments[1]);
+    std::uint32_t size = 0;
+    const std::int32_t status = morvik_link_soft_buffer_size(of.K, of.fillers, of.size, &size);
+    results[0] = mxIsEmpty(arguments[2]) ? numericMatrix(size, blocks, mxSINGLE_CLASS) : mxDuplicateArray(arguments[2]);
+    return status != MORVIK_LINK_OK ? status
+                                    : morvik_link_rate_recover(of.K,
+                                                               of.fillers,
+                                                               of.size,
+                                                               of.version,
+                                                               blocks,
+                                                               data<const float>(arguments[1]),
+                                                               mxGetM(arguments[1]),
+                                                               data<float>(results[0]));
+}
+
+/// matching -> values of a soft buffer
+std::int32_t bufferSize(Results results, Arguments arguments)
+{
+    const Matching of(arguments[0]);
+    std::uint32_t size = 0;
+    const std::int32_t status = morvik_link_soft_buffer_size(of.K, of.fillers, of.size, &size);
+    results[0] = mxCreateDoubleScalar(size);
+    return status;
+}
+
+/// matching, soft buffers, filler -> sys, par1, par2
+std::int32_t deinterleave(Results results, Arguments arguments)
+{
+    const Matching of(arguments[0]);
+    const std::size_t blocks = mxGetN(arguments[1]);
+    for (std::size_t s = 0; s < 3; ++s) {
+        results[s] = numericMatrix(of.K + tailPositions, blocks, mxSINGLE_CLASS);
+    }
+    return morvik_link_deinterleave(of.K,
+                                    of.fillers,
+                                    of.size,
+                                    blocks,
+                                    data<const float>(arguments[1]),
+                                    real(arguments[2]),
+                                    data<float>(results[0]),
+                                    data<float>(results[1]),
+                                    data<float>(results[2]));
+}
+
+/// ratios, scale -> soft values
+std::int32_t softValues(Results results, Arguments arguments)
+{
+    results[0] = numericMatrix(mxGetM(arguments[0]), mxGetN(arguments[0]), mxINT8_CLASS);
+    return morvik_link_soft_values(data<const float>(arguments[0]),
+                                   mxGetNumberOfElements(arguments[0]),
+                                   real(arguments[1]),
+                                   data<std::int8_t>(results[0]));
+}
+
+// ---- Modulation: a symbol is two rows, I and Q, or one for BPSK
+
+/// bits per symbol, bits -> symbols
+std::int32_t map(Results results, Arguments arguments)
+{
+    const std::uint32_t perSymbol = whole(arguments[0]);
+    const std::size_t count = mxGetM(arguments[1]) / perSymbol;
+    results[0] = numericMatrix(perSymbol == 1 ? count : 2 * count, mxGetN(arguments[1]), mxSINGLE_CLASS);
+    return morvik_link_map(perSymbol, bits(arguments[1]), count * mxGetN(arguments[1]), data<float>(results[0]));
+}
+
+/// bits per symbol, demapper, symbols, gains or nothing, noise variance -> ratios
+std::int32_t demap(Results results, Arguments arguments)
+{
+    const std::uint32_t perSymbol = whole(arguments[0]);
+    const std::size_t count = mxGetM(arguments[2]) / (perSymbol == 1 ? 1 : 2);
+    const std::size_t blocks = mxGetN(arguments[2]);
+    results[0] = numericMatrix(count * perSymbol, blocks, mxSINGLE_CLASS);
+    return morvik_link_demap(perSymbol,
+                             static_cast<std::int32_t>(whole(arguments[1])),
+                             data<const float>(arguments[2]),
+                             mxIsEmpty(arguments[3]) ? nullptr : data<const float>(arguments[3]),
+                             real(arguments[4]),
+                             count * blocks,
+                             data<float>(results[0]));
+}
+
+// ---- Transport blocks: a format is five numbers, in the order of morvik_link_format
+
+struct Destroy {
+    void operator()(morvik_link_transport* transport) const
+    {
+        morvik_link_transport_destroy(transport);
+    }
+};
+using Transport = std::unique_ptr<morvik_link_transport, Destroy>;
+
+morvik_link_format formatOf(const mxArray* numbers)
+{
+    return {whole(numbers), whole(numbers, 1), whole(numbers, 2), whole(numbers, 3), whole(numbers, 4)};
+}
+
+std::int32_t make(const mxArray* numbers, Transport& made)
+{
+    const morvik_link_format format = formatOf(numbers);
+    morvik_link_transport* transport = nullptr;
+    const std::int32_t status = morvik_link_transport_create(&format, &transport);
+    made.reset(transport);
+    return status;
+}
+
+morvik_link_places placesOf(const Transport& transport, std::uint32_t r)
+{
+    morvik_link_places places{};
+    morvik_link_transport_code_block(transport.get(), r, &places);
+    return places;
+}
+
+/// format, version, bits -> coded bits
+std::int32_t encode(Results results, Arguments arguments)
+{
+    Transport transport;
+    const std::int32_t status = make(arguments[0], transport);
+    const std::size_t blocks = mxGetN(arguments[2]);
+    results[0] = logicalMatrix(formatOf(arguments[0]).coded_bits, blocks);
+    return status != MORVIK_LINK_OK
+               ? status
+               : morvik_link_transport_encode(
+                     transport.get(), whole(arguments[1]), blocks, bits(arguments[2]), bits(results[0]));
+}
+
+/// format, version, ratios, soft buffers or nothing -> soft buffers
+std::int32_t recover(Results results, Arguments arguments)
+{
+    Transport transport;
+    const std::int32_t status = make(arguments[0], transport);
+    const std::size_t blocks = mxGetN(arguments[2]);
+    results[0] = mxIsEmpty(arguments[3])
+                     ? numericMatrix(morvik_link_transport_buffer_size(transport.get()), blocks, mxSINGLE_CLASS)
+                     : mxDuplicateArray(arguments[3]);
+    return status != MORVIK_LINK_OK ? status
+                                    : morvik_link_transport_recover(transport.get(),
+                                                                    whole(arguments[1]),
+                                                                    blocks,
+                                                                    data<const float>(arguments[2]),
+                                                                    data<float>(results[0]));
+}
+
+/// format -> values of a soft buffer
+std::int32_t transportBuffer(Results results, Arguments arguments)
+{
+    Transport transport;
+    const std::int32_t status = make(arguments[0], transport);
+    results[0] = mxCreateDoubleScalar(morvik_link_transport_buffer_size(transport.get()));
+    return status;
+}
+
+/// format, number of a code block, soft buffers, scale -> sys, par1, par2
+std::int32_t blockValues(Results results, Arguments arguments)
+{
+    Transport transport;
+    const std::int32_t status = make(arguments[0], transport);
+    const std::uint32_t r = whole(arguments[1]);
+    const std::size_t blocks = mxGetN(arguments[2]);
+    for (std::size_t s = 0; s < 3; ++s) {
+        results[s] = numericMatrix(placesOf(transport, r).size + tailPositions, blocks, mxINT8_CLASS);
+    }
+    return status != MORVIK_LINK_OK ? status
+                                    : morvik_link_transport_soft_values(transport.get(),
+                                                                        r,
+                                                                        blocks,
+                                                                        data<const float>(arguments[2]),
+                                                                        real(arguments[3]),
+                                                                        data<std::int8_t>(results[0]),
+                                                                        data<std::int8_t>(results[1]),
+                                                                        data<std::int8_t>(results[2]));
+}
+
+/// format, cell of the decisions on each code block -> bits, whether all CRCs fit, whether each code block's fits
+std::int32_t join(Results results, Arguments arguments)
+{
+    Transport transport;
+    std::int32_t status = make(arguments[0], transport);
+    const std::size_t count = mxGetNumberOfElements(arguments[1]);
+    const std::size_t blocks = mxGetN(mxGetCell(arguments[1], 0));
+    const std::size_t size = formatOf(arguments[0]).transport_block_size;
+    results[0] = logicalMatrix(size, blocks);
+    results[1] = logicalMatrix(1, blocks);
+    results[2] = logicalMatrix(count, blocks);
+    std::vector<std::uint8_t> joined(blocks * (size + parityBits));
+    std::vector<std::uint8_t> fits(blocks);
+    for (std::size_t r = 0; r < count && status == MORVIK_LINK_OK; ++r) {
+        status = morvik_link_transport_join(transport.get(),
+                                            static_cast<std::uint32_t>(r),
+                                            blocks,
+                                            bits(mxGetCell(arguments[1], static_cast<mwIndex>(r))),
+                                            joined.data(),
+                                            fits.data());
+        for (std::size_t b = 0; b < blocks; ++b) {
+            bits(results[2])[b * count + r] = fits[b];
+        }
+    }
+    if (status == MORVIK_LINK_OK) {
+        status = morvik_link_transport_check(transport.get(), blocks, joined.data(), bits(results[1]));
+    }
+    for (std::size_t b = 0; b < blocks; ++b) {
+        std::memcpy(bits(results[0]) + b * size, joined.data() + b * (size + parityBits), size);
+        for (std::size_t r = 0; r < count; ++r) {
+            bits(results[1])[b] &= bits(results[2])[b * count + r];
+        }
+    }
+    return status;
+}
+
+struct Command {
+    const char* name;
+    std::int32_t (*run)(Results results, Arguments arguments);
+};
+
+constexpr std::array<Command, 14> commands = {{{"crc", crc},
+                                               {"segment", segment},
+                                               {"rate_match", rateMatch},
+                                               {"rate_recover", rateRecover},
+                                               {"buffer_size", bufferSize},
+                                               {"deinterleave", deinterleave},
+                                               {"soft_values", softValues},
+                                               {"map", map},
+                                               {"demap", demap},
+                                               {"encode", encode},
+                                               {"recover", recover},
+                                               {"transport_buffer", transportBuffer},
+                                               {"block_values", blockValues},
+                                               {"join", join}}};
+
+}  // namespace
+
+void mexFunction(int, mxArray* plhs[], int, const mxArray* prhs[])
+{
+    std::int32_t status = MORVIK_LINK_OUT_OF_MEMORY;
+    try {
+        std::array<char, 20> name{};
+        mxGetString(prhs[0], name.data(), static_cast<mwSize>(name.size()));
+        for (const Command& command : commands) {
+            if (std::strcmp(command.name, name.data()) == 0) {
+                status = command.run(plhs + 2, prhs + 1);
+            }
+        }
+    } catch (const std::exception&) {
+        status = MORVIK_LINK_OUT_OF_MEMORY;
+    }
+    plhs[0] = mxCreateDoubleScalar(status);
+    plhs[1] = mxCreateString(morvik_link_status_text(status));
+}
