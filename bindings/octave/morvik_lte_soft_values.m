@@ -3,7 +3,7 @@
 %   values = morvik_lte_soft_values(ratios, scale)
 %
 % ratios    ln(P(1) / P(0)), finite
-% scale     steps for a ratio of 1: 5 suits max-log and scaled extrinsic values (default), 4 the correction table
+% scale     steps for a ratio of 1 (default 4)
 % values    int8: scaled, rounded with halves away from 0, clipped to -128 ... 127
 %
 % Errors:   morvik:badCall, morvik:badClass, morvik:badValue
@@ -14,7 +14,7 @@ function values = morvik_lte_soft_values(ratios, scale)
     if nargin < 1
         error('morvik:badCall', '%s: needs ratios', caller);
     elseif nargin < 2
-        scale = 5;
+        scale = 4;
     end
     values = morvik_lte_call(caller, 'soft_values', morvik_lte_ratios(caller, 'ratios', ratios), ...
         morvik_lte_positive(caller, 'scale', scale));

@@ -28,7 +28,6 @@ import numpy.typing as npt
 from morvik import _core
 from morvik._arguments import (
     DEFAULT_ITERATIONS,
-    algorithm_number,
     block_size as checked_block_size,
     expect_block,
     expect_unmasked,
@@ -41,6 +40,7 @@ from morvik._errors import Error
 from morvik._link import Streams, bits_of, three_streams
 
 __all__ = [
+    "DEFAULT_SCALE",
     "CodeBlock",
     "CodeBlocks",
     "Received",
@@ -56,9 +56,10 @@ __all__ = [
     "soft_values",
 ]
 
-# Steps of a soft value for a ratio of 1, by algorithm. With scaled extrinsic values, 5 is within 0.03 dB of the best
-# one for all modulations and code rates; the correction table's steps are those of true ratios.
-_SCALES = (5.0, 5.0, 4.0)
+DEFAULT_SCALE = 4.0
+"""Steps of a soft value for a log-likelihood ratio of 1, which are those of the correction table. With scaled extrinsic
+values, no other scale is better by more than 0.03 dB, at any modulation and code rate."""
+
 _BITS_PER_SYMBOL = {"bpsk": 1, "qpsk": 2, "16qam": 4, "64qam": 6, "256qam": 8}
 _DEMAPPERS = ("max-log", "exact")
 _CRC_BITS = 24
@@ -239,23 +240,19 @@ def deinterleave(
     return Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams))
 
 
-def soft_values(
-    llrs: npt.ArrayLike, scale: float | None = None, width: int = 8, *, algorithm: str | int = "scaled"
-) -> npt.NDArray[Any]:
+def soft_values(llrs: npt.ArrayLike, scale: float = DEFAULT_SCALE, width: int = 8) -> npt.NDArray[Any]:
     """Turns log-likelihood ratios into soft values: scaled, rounded with halves away from 0, and clipped.
 
     ``llrs``
         Of any shape, finite.
     ``scale``
-        Steps for a ratio of 1; None chooses it for the algorithm: 5, or 4 for ``"table"``.
+        Steps for a ratio of 1.
     ``width``
         Bits of a soft value. 8 gives int8, what :meth:`morvik.Decoder.decode` takes; other widths, 2 to 16, give int16,
         for soft buffers of this width.
-    ``algorithm``
-        The decoder's algorithm.
     """
     array = _ratios(llrs)
-    steps = _scale(scale, algorithm)
+    steps = _positive("scale", scale)
     flat = np.ascontiguousarray(array.reshape(-1))
     values: npt.NDArray[Any]
     if _width(width) == 8:
@@ -409,15 +406,13 @@ class Transport:
             self._core.recover_steps(_version(version), received, _width(width), sums)
         return sums.reshape(*array.shape[:-1], -1)
 
-    def soft_values(
-        self, buffers: npt.ArrayLike, scale: float | None = None, *, algorithm: str | int = "scaled"
-    ) -> list[Streams]:
+    def soft_values(self, buffers: npt.ArrayLike, scale: float | None = None) -> list[Streams]:
         """The soft values of each code block, for :meth:`morvik.Decoder.decode`: int8 of shape (K + 4,) or (n, K + 4).
 
         ``buffers``
             What :meth:`recover` returns. Those of whole steps are only clipped.
-        ``scale``, ``algorithm``
-            As for the function :func:`soft_values`.
+        ``scale``
+            Steps for a ratio of 1; :data:`DEFAULT_SCALE` when None.
         """
         array = plain_array("buffers", buffers)
         is_steps = array.dtype == np.int16
@@ -427,7 +422,7 @@ class Transport:
             array = _ratios(array, "buffers")
         self._expect_columns("buffers", array, self._core.buffer_size)
         rows = _rows(array)
-        steps = _scale(scale, algorithm)
+        steps = DEFAULT_SCALE if scale is None else _positive("scale", scale)
         blocks = (
             self._core.soft_values_of_steps(r, rows) if is_steps else self._core.soft_values(r, rows, steps)
             for r in range(self._code_blocks.number)
@@ -464,7 +459,7 @@ class Transport:
     ) -> Received:
         """Decodes soft buffers: :meth:`soft_values`, the decoder for all code blocks of one size at once, and
         :meth:`join`."""
-        blocks = self.soft_values(buffers, scale, algorithm=decoder.algorithm)
+        blocks = self.soft_values(buffers, scale)
         shape = blocks[0].sys.shape[:-1]
         decisions: list[npt.NDArray[np.uint8]] = []
         sizes = (self._code_blocks.size_minus, self._code_blocks.size_plus)
@@ -556,12 +551,6 @@ def _positive(name: str, value: Any) -> float:
     if not 0 < number < 3e38 or np.float32(number) == 0:
         raise ValueError(f"{name} must be a positive number that float32 holds, not {value!r}")
     return number
-
-
-def _scale(scale: float | None, algorithm: str | int) -> float:
-    if scale is None:
-        return _SCALES[integer("algorithm", algorithm_number(algorithm), 0, 2)]
-    return _positive("scale", scale)
 
 
 def _ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.float32]:
