@@ -49,7 +49,7 @@ std::int32_t deinterleave(std::uint32_t K,
         const link::RateMatching matching(K, fillers, unlimited(bufferSize));
         for (std::size_t b = 0; b < blocks; ++b) {
             const std::size_t at = b * (K + morvik::rules::tailPositions);
-            matching.deinterleave<Value>(
+            matching.deinterleave(
                 buffers + b * matching.size(), filler, {streams[0] + at, streams[1] + at, streams[2] + at});
         }
     });

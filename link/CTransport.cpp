@@ -45,7 +45,7 @@ std::int32_t softValuesOf(const morvik_link_transport* transport,
         for (std::size_t b = 0; b < blocks; ++b) {
             toSoftValues(buffers + b * code.softSize() + code.softOffset(r), values.size(), values.data());
             const std::size_t at = b * (code.blocks().size(r) + morvik::rules::tailPositions);
-            matching.deinterleave<std::int8_t>(
+            matching.deinterleave(
                 values.data(), link::fillerValue, {streams[0] + at, streams[1] + at, streams[2] + at});
         }
     });

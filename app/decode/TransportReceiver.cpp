@@ -75,7 +75,7 @@ const SoftBlock& TransportReceiver::softBlock(unsigned r)
     const std::size_t length = itsCode.blocks().size(r) + rules::tailPositions;
     std::array<std::vector<std::int8_t>, 3> streams;
     streams.fill(std::vector<std::int8_t>(length));
-    itsCode.matching(r).deinterleave<std::int8_t>(
+    itsCode.matching(r).deinterleave(
         itsValues.data(), link::fillerValue, {streams[0].data(), streams[1].data(), streams[2].data()});
     itsBlock.rsc1Sys.assign(streams[0].begin(), streams[0].end());
     itsBlock.rsc1Par.assign(streams[1].begin(), streams[1].end());

@@ -3,7 +3,6 @@
 // The remainder is kept with the highest power of D in bit 0, the order in which bits are packed and sent.
 #include "Crc.h"
 
-#include <algorithm>
 #include <array>
 
 #include "PackedBits.h"
@@ -16,36 +15,42 @@ namespace {
 constexpr std::uint32_t generatorA = 0xDF3261;
 constexpr std::uint32_t generatorB = 0xC60001;
 
-/// Entry b is the remainder after the eight bits b.
-using Table = std::array<std::uint32_t, 256>;
+/// Entry b of table i is the remainder after the eight bits b and 8 i zeros.
+using Tables = std::array<std::array<std::uint32_t, 256>, 8>;
 
-constexpr Table tableOf(std::uint32_t generator)
+constexpr Tables tablesOf(std::uint32_t generator)
 {
-    Table table{};
-    for (std::uint32_t byte = 0; byte < table.size(); ++byte) {
+    Tables tables{};
+    for (std::uint32_t byte = 0; byte < 256; ++byte) {
         std::uint32_t remainder = byte;
-        for (unsigned i = 0; i < 8; ++i) {
-            remainder = remainder >> 1 ^ ((remainder & 1) != 0 ? generator : 0);
+        for (auto& table : tables) {
+            for (unsigned i = 0; i < 8; ++i) {
+                remainder = remainder >> 1 ^ ((remainder & 1) != 0 ? generator : 0);
+            }
+            table[byte] = remainder;
         }
-        table[byte] = remainder;
     }
-    return table;
+    return tables;
 }
 
-constexpr Table tableA = tableOf(generatorA);
-constexpr Table tableB = tableOf(generatorB);
+constexpr Tables tablesA = tablesOf(generatorA);
+constexpr Tables tablesB = tablesOf(generatorB);
 
 std::uint32_t remainderOf(
-    const Table& table, std::uint32_t generator, const std::uint64_t* row, std::size_t first, std::size_t count)
+    const Tables& tables, std::uint32_t generator, const std::uint64_t* row, std::size_t first, std::size_t count)
 {
     std::uint32_t remainder = 0;
-    for (std::size_t done = 0; done < count; done += 64) {
-        const std::size_t now = std::min(count - done, std::size_t{64});
-        std::uint64_t bits = bitsAt(row, first + done, now);
-        for (std::size_t i = 0; i < now / 8; ++i, bits >>= 8) {
-            remainder = remainder >> 8 ^ table[(remainder ^ bits) & 0xFF];
+    const std::size_t whole = count / 64 * 64;
+    for (std::size_t done = 0; done < whole; done += 64) {
+        const std::uint64_t bits = bitsAt(row, first + done, 64) ^ remainder;
+        remainder = 0;
+        for (unsigned i = 0; i < tables.size(); ++i) {
+            remainder ^= tables[7 - i][bits >> 8 * i & 0xFF];
         }
-        for (std::size_t i = 0; i < now % 8; ++i, bits >>= 1) {
+    }
+    if (whole < count) {
+        std::uint64_t bits = bitsAt(row, first + whole, count - whole);
+        for (std::size_t i = whole; i < count; ++i, bits >>= 1) {
             remainder = remainder >> 1 ^ (((remainder ^ bits) & 1) != 0 ? generator : 0);
         }
     }
@@ -56,12 +61,12 @@ std::uint32_t remainderOf(
 
 std::uint32_t crc24a(const std::uint64_t* row, std::size_t first, std::size_t count)
 {
-    return remainderOf(tableA, generatorA, row, first, count);
+    return remainderOf(tablesA, generatorA, row, first, count);
 }
 
 std::uint32_t crc24b(const std::uint64_t* row, std::size_t first, std::size_t count)
 {
-    return remainderOf(tableB, generatorB, row, first, count);
+    return remainderOf(tablesB, generatorB, row, first, count);
 }
 
 }  // namespace morvik::link

@@ -2,10 +2,12 @@
 #include "RateMatching.h"
 
 #include <algorithm>
+#include <cstring>
 #include <stdexcept>
 #include <string>
 
 #include "PackedBits.h"
+#include "link/kernels/RowKernels.h"
 #include "rules/BlockSizes.h"
 #include "rules/Tail.h"
 
@@ -18,6 +20,9 @@ namespace {
 constexpr unsigned columns = 32;
 constexpr std::array<std::uint8_t, columns> columnOrder = {0, 16, 8, 24, 4, 20, 12, 28, 2, 18, 10, 26, 6, 22, 14, 30,
                                                            1, 17, 9, 25, 5, 21, 13, 29, 3, 19, 11, 27, 7, 23, 15, 31};
+
+/// Of one stream of the largest block, dummy bits included.
+constexpr std::size_t mostPositions = 6176;
 
 constexpr std::uint16_t null = 0xFFFF;  // more than any position: three streams have at most 18444 bits
 
@@ -33,11 +38,13 @@ std::vector<std::uint16_t> circularBuffer(unsigned K, unsigned fillers)
                                                 : static_cast<std::uint16_t>(stream * length + written - dummies);
     };
     std::vector<std::uint16_t> buffer(std::size_t{3} * size);
-    for (unsigned k = 0; k < size; ++k) {
-        const unsigned written = k % rows * columns + columnOrder[k / rows];
-        buffer[k] = place(0, written, fillers);
-        buffer[size + 2 * k] = place(1, written, fillers);
-        buffer[size + 2 * k + 1] = place(2, (written + 1) % size, 0);
+    unsigned k = 0;
+    for (const unsigned column : columnOrder) {
+        for (unsigned written = column; written < size; written += columns, ++k) {
+            buffer[k] = place(0, written, fillers);
+            buffer[size + 2 * k] = place(1, written, fillers);
+            buffer[size + 2 * k + 1] = place(2, written + 1 < size ? written + 1 : 0, 0);
+        }
     }
     return buffer;
 }
@@ -57,7 +64,7 @@ void forRuns(unsigned size, unsigned start, std::size_t count, Each each)
 
 }  // namespace
 
-RateMatching::RateMatching(unsigned K, unsigned fillers, unsigned bufferSize) : itsK(K), itsFillers(fillers)
+RateMatching::RateMatching(unsigned K, unsigned fillers, unsigned bufferSize) : itsK(K), itsFillers(fillers), itsRows(0)
 {
     if (rules::findBlockSize(K) == nullptr) {
         throw std::invalid_argument(std::to_string(K) + " is no block size of the LTE turbo code");
@@ -67,7 +74,7 @@ RateMatching::RateMatching(unsigned K, unsigned fillers, unsigned bufferSize) : 
                                     std::to_string(K));
     }
     std::vector<std::uint16_t> buffer = circularBuffer(K, fillers);
-    const auto rows = static_cast<unsigned>(buffer.size() / 3 / columns);
+    itsRows = static_cast<unsigned>(buffer.size() / 3 / columns);
     if (bufferSize < buffer.size()) {
         buffer.resize(bufferSize);
     }
@@ -80,12 +87,19 @@ RateMatching::RateMatching(unsigned K, unsigned fillers, unsigned bufferSize) : 
                                     " has no bit of a block of " + std::to_string(K));
     }
     for (unsigned version = 0; version < redundancyVersions; ++version) {
-        const unsigned k0 = rows * (2 * ((total + 8 * rows - 1) / (8 * rows)) * version + 2);
+        const unsigned k0 = itsRows * (2 * ((total + 8 * itsRows - 1) / (8 * itsRows)) * version + 2);
         itsStarts[version] = bitsBefore(k0 % total) % bitsBefore(total);
     }
-    std::copy_if(buffer.begin(), buffer.end(), std::back_inserter(itsPositions), [](std::uint16_t place) {
-        return place != null;
-    });
+    for (unsigned i = 0; i < total; ++i) {
+        if (buffer[i] == null) {
+            continue;
+        }
+        if (i == 0 || buffer[i - 1] == null) {
+            itsRuns.push_back({static_cast<std::uint16_t>(itsPositions.size()), static_cast<std::uint16_t>(i), 0});
+        }
+        itsPositions.push_back(buffer[i]);
+        ++itsRuns.back().count;
+    }
 }
 
 void RateMatching::interleave(const std::array<const std::uint64_t*, 3>& streams, std::uint64_t* buffer) const
@@ -108,31 +122,27 @@ void RateMatching::select(
 
 void RateMatching::recover(const float* received, unsigned version, std::size_t count, float* buffer) const
 {
-    forRuns(size(), itsStarts[version], count, [=](unsigned first, std::size_t done, std::size_t now) {
-        for (std::size_t i = 0; i < now; ++i) {
-            buffer[first + i] += received[done + i];
-        }
+    const RowKernels& kernels = rowKernels();
+    forRuns(size(), itsStarts[version], count, [=, &kernels](unsigned first, std::size_t done, std::size_t now) {
+        kernels.add(received + done, now, buffer + first);
     });
 }
 
 void RateMatching::recover(
     const std::int16_t* received, unsigned version, std::size_t count, unsigned width, std::int16_t* buffer) const
 {
-    const int most = (1 << (width - 1)) - 1;
-    forRuns(size(), itsStarts[version], count, [=](unsigned first, std::size_t done, std::size_t now) {
-        for (std::size_t i = 0; i < now; ++i) {
-            const int sum = buffer[first + i] + received[done + i];
-            buffer[first + i] = static_cast<std::int16_t>(std::clamp(sum, -most - 1, most));
-        }
+    const std::int32_t most = (1 << (width - 1)) - 1;
+    const RowKernels& kernels = rowKernels();
+    forRuns(size(), itsStarts[version], count, [=, &kernels](unsigned first, std::size_t done, std::size_t now) {
+        kernels.addClipped(received + done, now, most, buffer + first);
     });
 }
 
-template <typename Value>
-void RateMatching::deinterleave(const Value* buffer, Value filler, const std::array<Value*, 3>& streams) const
+void RateMatching::deinterleave(const float* buffer, float filler, const std::array<float*, 3>& streams) const
 {
     const unsigned length = itsK + rules::tailPositions;
-    for (Value* const stream : streams) {
-        std::fill_n(stream, length, Value{0});
+    for (float* const stream : streams) {
+        std::fill_n(stream, length, 0.0F);
     }
     std::fill_n(streams[0], itsFillers, filler);
     std::fill_n(streams[1], itsFillers, filler);
@@ -141,9 +151,29 @@ void RateMatching::deinterleave(const Value* buffer, Value filler, const std::ar
     }
 }
 
-template void RateMatching::deinterleave(const float* buffer, float filler, const std::array<float*, 3>& streams) const;
-template void RateMatching::deinterleave(const std::int8_t* buffer,
-                                         std::int8_t filler,
-                                         const std::array<std::int8_t*, 3>& streams) const;
+void RateMatching::deinterleave(const std::int8_t* buffer,
+                                std::int8_t filler,
+                                const std::array<std::int8_t*, 3>& streams) const
+{
+    const std::size_t matrix = std::size_t{columns} * itsRows;
+    std::array<std::uint8_t, 3 * mostPositions> sent{};
+    for (const Run& run : itsRuns) {
+        std::memcpy(&sent[run.to], buffer + run.from, run.count);
+    }
+    std::array<std::uint8_t, mostPositions> systematic;
+    std::array<std::uint8_t, mostPositions> parity1;
+    std::array<std::uint8_t, mostPositions> parity2;
+    const RowKernels& kernels = rowKernels();
+    kernels.rowsOfOne(sent.data(), itsRows, systematic.data());
+    kernels.rowsOfTwo(&sent[matrix], itsRows, parity1.data(), parity2.data());
+    // There are 4 dummy bits or more, and the second parity is read one position later than the others.
+    const std::size_t length = itsK + rules::tailPositions;
+    const std::size_t dummies = matrix - length;
+    std::memcpy(streams[0], &systematic[dummies], length);
+    std::memcpy(streams[1], &parity1[dummies], length);
+    std::memcpy(streams[2], &parity2[dummies - 1], length);
+    std::fill_n(streams[0], itsFillers, filler);
+    std::fill_n(streams[1], itsFillers, filler);
+}
 
 }  // namespace morvik::link

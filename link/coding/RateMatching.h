@@ -46,7 +46,8 @@ public:
         return itsPositions;
     }
 
-    /// Puts the three packed streams of K + 4 bits into a packed circular buffer.
+    /// Puts the three packed streams of K + 4 bits into a packed circular buffer, bit by bit. TurboEncoder does so for
+    /// many blocks at once.
     void interleave(const std::array<const std::uint64_t*, 3>& streams, std::uint64_t* buffer) const;
 
     /// Writes `count` bits (E) of a redundancy version to a packed row, from bit `to` on.
@@ -60,14 +61,23 @@ public:
     void recover(
         const std::int16_t* received, unsigned version, std::size_t count, unsigned width, std::int16_t* buffer) const;
 
-    /// Puts soft values of the circular buffer into the three streams of K + 4 values: filler bits as `filler`, what
-    /// the buffer does not hold as 0. Value is float or std::int8_t.
-    template <typename Value>
-    void deinterleave(const Value* buffer, Value filler, const std::array<Value*, 3>& streams) const;
+    /// Puts values of the circular buffer into the three streams of K + 4 values: filler bits as `filler`, what the
+    /// buffer does not hold as 0.
+    void deinterleave(const float* buffer, float filler, const std::array<float*, 3>& streams) const;
+    void deinterleave(const std::int8_t* buffer, std::int8_t filler, const std::array<std::int8_t*, 3>& streams) const;
 
 private:
+    /// Values that follow each other in the circular buffer with dummy and filler bits, too.
+    struct Run {
+        std::uint16_t from;  ///< in the buffer without them
+        std::uint16_t to;    ///< in the one with them
+        std::uint16_t count;
+    };
+
     unsigned itsK;
     unsigned itsFillers;
+    unsigned itsRows;  ///< of the sub-block interleaver
+    std::vector<Run> itsRuns;
     std::array<unsigned, redundancyVersions> itsStarts{};
     std::vector<std::uint16_t> itsPositions;
 };

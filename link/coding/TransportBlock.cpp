@@ -77,42 +77,41 @@ void TransportBlockCode::encode(const PackedBlocks& information, unsigned count,
 {
     buffers.words = bufferWords();
     buffers.bits.resize(count * buffers.words);
-    std::vector<Place> places;
-    for (const auto& each : itsEncoders) {
+    for (unsigned kind = 0; kind < itsKinds.size(); ++kind) {
+        itsPlaces.clear();
         for (unsigned b = 0; b < count; ++b) {
             for (unsigned r = 0; r < itsBlocks.count; ++r) {
-                if (itsBlocks.size(r) == each.first) {
-                    places.push_back({b, r});
+                if (itsKindOf[r] != kind) {
+                    continue;
                 }
-                if (places.size() == TurboEncoder::blocksAtOnce) {
-                    encode(information, places, buffers);
-                    places.clear();
+                itsPlaces.push_back({b, r});
+                if (itsPlaces.size() == TurboEncoder::blocksAtOnce) {
+                    encodePlaces(information, buffers);
                 }
             }
         }
-        if (!places.empty()) {
-            encode(information, places, buffers);
-            places.clear();
+        if (!itsPlaces.empty()) {
+            encodePlaces(information, buffers);
         }
     }
 }
 
-/// Encodes code blocks of one size, up to TurboEncoder::blocksAtOnce.
-void TransportBlockCode::encode(const PackedBlocks& information,
-                                const std::vector<Place>& places,
-                                PackedBlocks& buffers)
+/// Encodes the code blocks of itsPlaces, which are of one kind, up to TurboEncoder::blocksAtOnce, and forgets them.
+void TransportBlockCode::encodePlaces(const PackedBlocks& information, PackedBlocks& buffers)
 {
-    TurboEncoder& encoder = itsEncoders.at(itsBlocks.size(places.front().r));
-    PackedBlocks framed{encoder.words(), std::vector<std::uint64_t>(places.size() * encoder.words())};
-    for (unsigned i = 0; i < places.size(); ++i) {
-        frame(information.block(places[i].b), places[i].r, framed.block(i));
+    const unsigned any = itsPlaces.front().r;
+    TurboEncoder& encoder = itsEncoders.at(itsBlocks.size(any));
+    const auto count = static_cast<unsigned>(itsPlaces.size());
+    itsFramed.words = encoder.words();
+    itsFramed.bits.assign(count * itsFramed.words, 0);
+    std::array<std::uint64_t*, TurboEncoder::blocksAtOnce> rows{};
+    for (unsigned i = 0; i < count; ++i) {
+        const Place& place = itsPlaces[i];
+        frame(information.block(place.b), place.r, itsFramed.block(i));
+        rows[i] = buffers.block(place.b) + itsWordOffsets[place.r];
     }
-    encoder.encode(framed, static_cast<unsigned>(places.size()), itsStreams);
-    for (unsigned i = 0; i < places.size(); ++i) {
-        const Place& place = places[i];
-        matching(place.r).interleave({itsStreams[0].block(i), itsStreams[1].block(i), itsStreams[2].block(i)},
-                                     buffers.block(place.b) + itsWordOffsets[place.r]);
-    }
+    encoder.encode(itsFramed, count, matching(any).positions(), rows.data());
+    itsPlaces.clear();
 }
 
 void TransportBlockCode::frame(const std::uint64_t* row, unsigned r, std::uint64_t* block) const

@@ -110,7 +110,7 @@ private:
     };
 
     void layOut();
-    void encode(const PackedBlocks& information, const std::vector<Place>& places, PackedBlocks& buffers);
+    void encodePlaces(const PackedBlocks& information, PackedBlocks& buffers);
 
     TransportFormat itsFormat;
     CodeBlocks itsBlocks;
@@ -120,7 +120,8 @@ private:
     std::vector<std::size_t> itsSoftOffsets;
     std::vector<std::size_t> itsPayloadOffsets;
     std::map<unsigned, TurboEncoder> itsEncoders;  ///< by block size
-    TurboEncoder::Streams itsStreams;
+    std::vector<Place> itsPlaces;                  ///< code blocks that are encoded at once,
+    PackedBlocks itsFramed;                        ///< and their bits
 };
 
 }  // namespace morvik::link

@@ -78,10 +78,7 @@ TurboEncoder::TurboEncoder(unsigned K)
 
 void TurboEncoder::encode(const PackedBlocks& information, unsigned count, Streams& streams)
 {
-    for (unsigned word = 0; word < itsWords; ++word) {
-        gather(information, word, count);
-    }
-    encodeSlices();
+    encodeSlices(information, count);
     for (unsigned s = 0; s < streams.size(); ++s) {
         streams[s].words = itsWords;
         streams[s].bits.resize(std::size_t{count} * itsWords);
@@ -95,8 +92,35 @@ void TurboEncoder::encode(const PackedBlocks& information, unsigned count, Strea
     }
 }
 
-void TurboEncoder::encodeSlices()
+void TurboEncoder::encode(const PackedBlocks& information,
+                          unsigned count,
+                          const std::vector<std::uint16_t>& order,
+                          std::uint64_t* const* rows)
 {
+    encodeSlices(information, count);
+    const std::size_t length = itsK + rules::tailPositions;
+    BitMatrix matrix;
+    for (std::size_t first = 0; first < order.size(); first += matrix.size()) {
+        const std::size_t now = std::min(order.size() - first, matrix.size());
+        for (std::size_t i = 0; i < now; ++i) {
+            const std::size_t bit = order[first + i];
+            const std::size_t stream = (bit >= length ? 1U : 0U) + (bit >= 2 * length ? 1U : 0U);
+            matrix[i] = itsSlices[stream][bit - stream * length];
+        }
+        std::fill(matrix.begin() + static_cast<std::ptrdiff_t>(now), matrix.end(), 0);
+        transpose(matrix);
+        for (unsigned b = 0; b < count; ++b) {
+            rows[b][first / matrix.size()] = matrix[b];
+        }
+    }
+}
+
+/// Encodes one slice after the other.
+void TurboEncoder::encodeSlices(const PackedBlocks& information, unsigned count)
+{
+    for (unsigned word = 0; word < itsWords; ++word) {
+        gather(information, word, count);
+    }
     auto& [systematic, parity1, parity2] = itsSlices;
     ConstituentEncoder first;
     ConstituentEncoder second;

@@ -33,10 +33,17 @@ public:
     /// of the streams behind K + 4.
     void encode(const PackedBlocks& information, unsigned count, Streams& streams);
 
+    /// The same in another order: the bits of block b become a packed row, rows[b]. Bit i of a row is bit order[i] of
+    /// the block, counted through its three streams of K + 4 bits.
+    void encode(const PackedBlocks& information,
+                unsigned count,
+                const std::vector<std::uint16_t>& order,
+                std::uint64_t* const* rows);
+
 private:
     using Slices = std::vector<std::uint64_t>;  ///< one word for each position: its bits of all blocks
 
-    void encodeSlices();
+    void encodeSlices(const PackedBlocks& information, unsigned count);
     void gather(const PackedBlocks& information, unsigned word, unsigned count);
     void scatter(unsigned stream, unsigned word, unsigned count, PackedBlocks& blocks) const;
 

@@ -37,9 +37,6 @@ void demapSymbols(Modulation modulation,
                   std::size_t count,
                   float* ratios);
 
-/// ln(1 + exp(-x)) for x of at least 0, off by at most 2e-7.
-float logOnePlusExp(float x);
-
 }  // namespace morvik::link
 
 #endif

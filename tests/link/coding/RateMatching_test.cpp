@@ -73,7 +73,7 @@ std::array<std::vector<float>, 3> received(const RateMatching& matching,
     for (auto& stream : streams) {
         stream.assign(c.K + 4, -1);
     }
-    matching.deinterleave<float>(buffer.data(), -1000, {streams[0].data(), streams[1].data(), streams[2].data()});
+    matching.deinterleave(buffer.data(), -1000, {streams[0].data(), streams[1].data(), streams[2].data()});
     return streams;
 }
 

@@ -91,7 +91,7 @@ bool decode(const TransportBlockCode& code, const std::vector<float>& buffer, By
         for (auto& stream : streams) {
             stream.resize(K + 4);
         }
-        code.matching(r).deinterleave<std::int8_t>(
+        code.matching(r).deinterleave(
             values.data(), morvik::link::fillerValue, {streams[0].data(), streams[1].data(), streams[2].data()});
         Bytes decided(K);
         veltra_ip_morvik_v1_0_batch_outputs outputs{};
@@ -177,7 +177,7 @@ TEST(TransportBlockTest, AddsReceivedValuesWhereTheirBitsCameFrom)
         for (unsigned r = 0; r < expected.size(); ++r) {
             std::array<std::vector<float>, 3> streams;
             streams.fill(std::vector<float>(code.blocks().size(r) + 4));
-            code.matching(r).deinterleave<float>(
+            code.matching(r).deinterleave(
                 &buffer[code.softOffset(r)], 0, {streams[0].data(), streams[1].data(), streams[2].data()});
             ASSERT_EQ(streams, expected[r]) << code.format().bits << ' ' << r;
         }
