@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstring>
 #include <vector>
 
 namespace morvik::link {
@@ -79,7 +80,7 @@ void copyEntries(const SymbolTable& table, const std::uint64_t* row, std::size_t
         if (64 % bits != 0 && first % 64 > 64 - bits) {
             own |= row[first / 64 + 1] << (64 - first % 64);
         }
-        std::copy_n(start + static_cast<std::size_t>(own & mask) * numbers, numbers, to + e * numbers);
+        std::memcpy(to + e * numbers, start + static_cast<std::size_t>(own & mask) * numbers, numbers * sizeof(float));
     }
 }
 
