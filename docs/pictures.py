@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Draws the pictures of docs/algorithm.md, docs/arithmetic.md and CONTRIBUTING.md, SVG files beside this one.
+"""Draws the pictures of docs/algorithm.md, docs/arithmetic.md, docs/link.md and CONTRIBUTING.md, SVG files beside this one.
 
     pictures.py [FOLDER]     FOLDER is where the pictures go, if not beside this file
 
@@ -388,6 +388,40 @@ def flow():
     return svg(1100, bottom + 20, both.elements + lanes.elements + components.elements)
 
 
+def link():
+    """The LTE chain: the transmitter goes down, the receiver up; what undoes a step stands beside it."""
+    sent, received = Way(20, 400), Way(560, 400)
+    pairs = (
+        (("Transport block of A bits, and its CRC (5.1.1)", "link/coding/Crc.h: crc24a"),
+         ("CRC of the transport block", "link/coding/TransportBlock.h: fits")),
+        (("C code blocks, F filler bits, CRCs (5.1.2)", "link/coding/CodeBlocks.h: codeBlocksOf"),
+         ("Decisions joined, CRC of each code block", "link/coding/TransportBlock.h: join")),
+        (("Turbo code: three streams of K + 4 bits (5.1.3)", "link/coding/TurboEncoder.h: encode"),
+         ("The core", "include/morvik_v1_0_batch.h: batch_simulate_i8")),
+        (("Sub-block interleavers, circular buffer (5.1.4.1.1)", "link/coding/RateMatching.h: positions"),
+         ("Three streams: filler bits -128, not received 0", "link/coding/RateMatching.h: deinterleave")),
+        (("E bits from k0 on, N_cb positions (5.1.4.1.2)", "link/coding/RateMatching.h: select"),
+         ("Soft buffer: transmissions are added", "link/coding/RateMatching.h: recover")),
+        (("G bits, code block after code block (5.1.5)", "link/coding/TransportBlock.h: select"),
+         ("Ratios of each code block", "link/coding/TransportBlock.h: recover")),
+        (("Symbols of Q_m bits (36.211, 7.1)", "link/modulation/Mapper.h: mapSymbols"),
+         ("Log-likelihood ratios of bits", "link/modulation/Demapper.h: demapSymbols")))
+    y = 44
+    ways = [text(sent.middle, 26, "Transmitter"), text(received.middle, 26, "Receiver")]
+    for row, (down, up) in enumerate(pairs):
+        sent.station(y, *down)
+        bottom = received.station(y, *up)
+        if row > 0:
+            ways += [arrow(sent.middle, y - 20, sent.middle, y), arrow(received.middle, y, received.middle, y - 20)]
+        if row in (3, 4):
+            ways.append(text(received.middle + 10, y - 6, ("soft values", "ratios x scale, rounded, clipped")[row - 3],
+                             "start", "small"))
+        y = bottom + 20
+    middle = bottom - 22
+    ways += [arrow(sent.left + sent.width, middle, received.left, middle), text(490, middle - 8, "noise, fading", kind="small")]
+    return svg(980, bottom + 20, ways + sent.elements + received.elements)
+
+
 if __name__ == "__main__":
-    for picture in (trellis, windows, turbo, interleaver, borders, flow):
+    for picture in (trellis, windows, turbo, interleaver, borders, flow, link):
         (FOLDER / f"{picture.__name__}.svg").write_text(picture())

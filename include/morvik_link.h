@@ -11,6 +11,19 @@
  * those before them one step each. What a decoder needs in between comes from morvik_v1_0_batch.h, whose arrays are
  * laid out as they are here.
  *
+ * @par Example: a transport block of 1000 bits in 1500 bits of QPSK, and its soft values for the core
+ *
+ *     static uint8_t bits[1000], coded[1500];       // fill in the bits
+ *     static float ratios[1500], buffer[3084];      // ratios as morvik_link_demap gives them
+ *     static int8_t sys[1028], par1[1028], par2[1028];
+ *     morvik_link_format format = {1000, 1500, 2, 1, 0};
+ *     morvik_link_transport* transport;
+ *     if (morvik_link_transport_create(&format, &transport) != MORVIK_LINK_OK) return 1;
+ *     morvik_link_transport_encode(transport, 0, 1, bits, coded);
+ *     morvik_link_transport_recover(transport, 0, 1, ratios, buffer);
+ *     morvik_link_transport_soft_values(transport, 0, 1, buffer, 4, sys, par1, par2);
+ *     morvik_link_transport_destroy(transport);
+ *
  * @par Arrays
  *   All arrays are the caller's, of the size that a function states, in rows one after the other: with `blocks` blocks,
  *   "K values of each" means blocks * K values. Arrays that are read may not overlap those that are written. `blocks`

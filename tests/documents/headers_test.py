@@ -36,7 +36,7 @@ def main():
         sys.exit(__doc__)
     for header in map(pathlib.Path, sys.argv[1:]):
         lines = example_of(header)
-        parameters = "void" if "create_state" in lines else "veltra_ip_morvik_v1_0_state* state"
+        parameters = "void" if "create_state" in lines or "morvik_link" in header.name else "veltra_ip_morvik_v1_0_state* state"
         program = BEFORE.format(name=header.name, parameters=parameters) + lines + AFTER
         subprocess.run(["cc", "-std=c99", "-Wall", "-Wextra", "-Werror", "-Wno-unused-variable", "-Wno-unused-but-set-variable",
                         f"-I{header.parent}", "-fsyntax-only", "-x", "c", "-"], input=program, text=True, check=True)
