@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Checks that what the lanes' compilation for an instruction set offers to the linker is all of its own namespace.
+# Checks that what a compilation for an instruction set offers to the linker is all of its own namespace.
 # A shared inline function, compiled with that set's instructions, could be the one that the linker keeps for
 # everybody, and that a machine without them would run.
 #   lane_objects.sh NAMESPACE OBJECT...
@@ -7,8 +7,8 @@ set -eu
 namespace=$1
 shift
 symbols=$(nm -C --defined-only --extern-only "$@")
-if ! grep -q -F " $namespace::instructionSet" <<<"$symbols"; then
-    echo "$namespace::instructionSet is not defined" >&2
+if ! grep -q -F " $namespace::" <<<"$symbols"; then
+    echo "$namespace:: has no symbols" >&2
     exit 1
 fi
 # Templates of other namespaces over the compilation's own types are its own, too. With 32 bits, the compiler adds
