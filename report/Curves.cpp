@@ -2,6 +2,7 @@
 #include "Curves.h"
 
 #include <algorithm>
+#include <cmath>
 #include <map>
 #include <utility>
 
@@ -32,6 +33,11 @@ std::string titleOf(const Setting& setting)
 
 }  // namespace
 
+double Sample::place() const
+{
+    return std::isfinite(esn0) ? esn0 : ebn0;
+}
+
 std::vector<Curve> curvesOf(const std::vector<Row>& rows)
 {
     const bool hasIterations = std::any_of(rows.begin(), rows.end(), [&rows](const Row& row) {
@@ -56,7 +62,7 @@ std::vector<Curve> curvesOf(const std::vector<Row>& rows)
     }
     for (Curve& curve : curves) {
         std::stable_sort(curve.samples.begin(), curve.samples.end(), [](const Sample& a, const Sample& b) {
-            return a.ebn0 < b.ebn0;
+            return a.place() < b.place();
         });
     }
     return curves;
@@ -71,9 +77,9 @@ std::vector<Curve> againstIterations(const std::vector<Curve>& curves)
         });
         for (const Sample& sample : curve.samples) {
             if (sample.iterations != 0) {
-                Curve& across = found[{static_cast<std::size_t>(first - curves.begin()), sample.ebn0}];
+                Curve& across = found[{static_cast<std::size_t>(first - curves.begin()), sample.place()}];
                 const std::string separator = curve.family.empty() ? "" : ", ";
-                across.title = curve.family + separator + decibels(sample.ebn0) + " dB";
+                across.title = curve.family + separator + decibels(sample.place()) + " dB";
                 across.family = curve.family;
                 across.reference = curve.reference;
                 across.samples.push_back(sample);

@@ -15,7 +15,7 @@ constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
 
 /// One point of a curve. The bounds are the 95 % confidence interval; without them no bar is drawn.
 struct Sample {
-    double ebn0 = 0;        // in dB
+    double ebn0 = 0;        // in dB, or unknown
     double esn0 = unknown;  // in dB, if it is the axis
 
     double ber = unknown;
@@ -42,6 +42,9 @@ struct Sample {
     double clipped = unknown;  // fraction of clipped soft values
     unsigned iterations = 0;   // iterations before the count; 0 if unknown
     std::size_t row = 0;       // its row in the table
+
+    /// Where it is drawn: Es/N0, if that is known, or Eb/N0.
+    double place() const;
 };
 
 /// A series of the plot.

@@ -136,9 +136,8 @@ std::string curveJson(const View& view, std::size_t index)
 
 std::string rowJson(const Sample& sample)
 {
-    const double place = std::isfinite(sample.esn0) ? sample.esn0 : sample.ebn0;
     return "{\"row\":" + json(rowName(sample)) + ",\"ebn0\":" + json(sample.ebn0) + ",\"esn0\":" + json(sample.esn0) +
-           ",\"place\":" + json(decibels(place)) + ",\"iterations\":" + std::to_string(sample.iterations) +
+           ",\"place\":" + json(decibels(sample.place())) + ",\"iterations\":" + std::to_string(sample.iterations) +
            ",\"ber\":" + json(bitErrorRate.of(sample)) + ",\"bler\":" + json(blockErrorRate.of(sample)) +
            ",\"bits\":" + json(throughput.of(sample)) + ",\"counts\":" + countsJson(sample) + '}';
 }

@@ -94,8 +94,8 @@ private:
         nameAlike("fer", "bler");
         nameAlike("frames", "blocks");
         nameAlike("frame_errors", "block_errors");
-        if (!indexOf("ebn0_db") || (!indexOf("ber") && !indexOf("bler"))) {
-            fail("this line must name the columns, ebn0_db and one of ber, bler and fer among them");
+        if ((!indexOf("ebn0_db") && !indexOf("esn0_db")) || (!indexOf("ber") && !indexOf("bler"))) {
+            fail("this line must name the columns, ebn0_db or esn0_db and one of ber, bler and fer among them");
         }
     }
 
@@ -131,7 +131,24 @@ private:
         setting.algorithm = text("algorithm");
         setting.iterations = static_cast<unsigned>(count("iterations", UINT32_MAX));
         setting.scale = text("scale_option");
+        setting.sent = sentText();
         return setting;
+    }
+
+    /// What is sent, if it is not plain code blocks over BPSK.
+    std::string sentText() const
+    {
+        if (!text("mcs").empty()) {
+            return "MCS " + text("mcs");
+        }
+        const std::string modulation = text("modulation");
+        const std::uint64_t A = count("transport_block_size", UINT32_MAX);
+        if (A > 0) {
+            const std::uint64_t G = count("coded_bits", UINT32_MAX);
+            return "A = " + std::to_string(A) + (G > 0 ? ", G = " + std::to_string(G) : "") +
+                   (modulation.empty() ? "" : ", " + modulation);
+        }
+        return modulation.empty() || modulation == "bpsk" ? "" : "K = " + text("block_size") + ", " + modulation;
     }
 
     unsigned blockSize() const
@@ -174,9 +191,11 @@ private:
     {
         Sample sample;
         sample.ebn0 = number("ebn0_db", -1000, 1000);
-        if (std::isnan(sample.ebn0)) {
-            fail("row without a value in the column ebn0_db");
+        sample.esn0 = number("esn0_db", -1000, 1000);
+        if (std::isnan(sample.place())) {
+            fail(std::string("row without a value in the column ") + (indexOf("ebn0_db") ? "ebn0_db" : "esn0_db"));
         }
+        sample.throughput = number("throughput", 0, 1000);
         sample.ber = number("ber", 0, 1);
         sample.berLow = number("ber_low", 0, 1);
         sample.berHigh = number("ber_high", 0, 1);
@@ -212,7 +231,8 @@ private:
             fail("block_errors " + std::to_string(sample.blockErrors) + " cannot be, of " +
                  std::to_string(sample.blocks) + " blocks");
         }
-        const unsigned K = row.setting.blockSize;
+        // A transport block may have several code blocks of K bits.
+        const unsigned K = count("transport_block_size", UINT32_MAX) > 0 ? 0 : row.setting.blockSize;
         if (K > 0 && sample.bitErrors > 0 && (sample.bitErrors - 1) / K >= sample.blocks) {
             fail("bit_errors " + std::to_string(sample.bitErrors) + " cannot be, of " + std::to_string(sample.blocks) +
                  " blocks of " + std::to_string(K) + " bits");

@@ -107,3 +107,20 @@ TEST(Curves, AgainstIterationsKeepReferencesApart)
 }
 
 }  // namespace
+
+TEST(Curves, SchemesAreAFamilyIfAllHaveTheSameIterations)
+{
+    const auto row = [](const std::string& sent, unsigned iterations) {
+        Row made;
+        made.setting = {512, 2, "scaled", iterations, "auto", sent, ", rayleigh"};
+        made.sample.esn0 = 1;
+        return made;
+    };
+    std::vector<Curve> curves = curvesOf({row("MCS 64qam 1", 8), row("MCS 64qam 2", 8)});
+    ASSERT_EQ(curves.size(), 2U);
+    EXPECT_EQ(curves[0].title, "MCS 64qam 1, rayleigh, 2 units, scaled, 8 iterations");
+    EXPECT_EQ(curves[0].family, curves[1].family);
+    curves = curvesOf({row("MCS 64qam 1", 8), row("MCS 64qam 2", 8), row("MCS 64qam 2", 6)});
+    EXPECT_NE(curves[0].family, curves[1].family);
+    EXPECT_EQ(curves[1].family, curves[2].family);
+}

@@ -237,3 +237,18 @@ TEST_F(Plot, ShowsIterationsInPanelsOfTheirOwn)
 }
 
 }  // namespace
+
+TEST_F(Plot, ShowsTheThroughputBesideShannonsLimit)
+{
+    std::vector<Curve> curves = morvik::support::sampleCurves();
+    EXPECT_EQ(drawn("rates.svg", curves).find("Shannon"), std::string::npos);
+    for (Sample& sample : curves[1].samples) {
+        sample.esn0 = sample.ebn0 + 2;
+        sample.throughput = 1.5 * (1 - sample.bler);
+    }
+    const std::string picture = drawn("throughput.svg", curves);
+    EXPECT_NE(picture.find("Throughput in bits per symbol; dotted: Shannon's limit"), std::string::npos);
+    EXPECT_NE(picture.find("Block error rate (BLER)"), std::string::npos);
+    EXPECT_EQ(picture.find("Bit error rate"), std::string::npos);
+    EXPECT_NE(picture.find("throughput against Es/N0"), std::string::npos) << "in the description";
+}

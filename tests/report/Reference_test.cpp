@@ -154,6 +154,20 @@ TEST_F(Reference, LocalesHaveNoSay)
                   ":2: \"2.5\" in the column ber is not allowed, allowed are numbers from 0 to 1");
 }
 
+TEST_F(Reference, TakesTransportBlocksOverEsN0)
+{
+    const auto curves = read(
+        "transport_block_size,coded_bits,esn0_db,blocks,block_errors,bit_errors,bler\n"
+        "1000,1500,3.1,158,100,5655,0.6329\n1000,1500,2.5,100,100,9650,1\n");
+    ASSERT_EQ(curves.size(), 1U);
+    EXPECT_EQ(curves[0].title, "rates: A = 1000, G = 1500");
+    EXPECT_EQ(curves[0].samples.at(0).esn0, 2.5);
+    EXPECT_EQ(curves[0].samples.at(1).bler, 0.6329);
+    EXPECT_EQ(read("mcs,esn0_db,ebn0_db,throughput,bler\n64qam 3,1,2,0.5,0\n").at(0).title, "rates: MCS 64qam 3");
+    EXPECT_EQ(read("block_size,modulation,ebn0_db,bler\n40,16qam,2,0.5\n").at(0).title, "rates: K = 40, 16qam");
+    expectRefused("esn0_db,ber\n,0.5\n", ":2: row without a value in the column esn0_db");
+}
+
 TEST_F(Reference, RefusesFilesThatCannotBeRead)
 {
     for (const auto& [name, reason] : {std::pair("missing.csv", ": cannot be opened: No such file or directory"),
@@ -176,7 +190,8 @@ TEST_F(Reference, RefusesFilesWithoutRates)
 
 TEST_F(Reference, RefusesOtherColumns)
 {
-    const std::string words = "this line must name the columns, ebn0_db and one of ber, bler and fer among them";
+    const std::string words =
+        "this line must name the columns, ebn0_db or esn0_db and one of ber, bler and fer among them";
     expectRefused("0.0,1e-1,1e-2\n", ":1: " + words);
     expectRefused("# a\nebn0_db,rate\n", ":2: " + words);
     expectRefused("ber,fer\n", ":1: " + words);

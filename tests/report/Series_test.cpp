@@ -39,6 +39,23 @@ TEST(Series, OnlyRatesAboveZeroCanBeDrawn)
     EXPECT_TRUE((Rate{0.1, 0, 0.2, false}.hasInterval()));
 }
 
+TEST(Series, ThroughputsTakeThePlaceOfBitErrorRates)
+{
+    Sample sample;
+    sample.ebn0 = 1;
+    sample.bler = 1;
+    std::vector<Curve> curves = {{"a", false, {sample}}};
+    EXPECT_EQ(quantitiesOf(curves), (std::vector<const Quantity*>{&bitErrorRate, &blockErrorRate}));
+    EXPECT_EQ(viewsOf(curves)[0].axis, &ebn0Axis);
+    curves[0].samples[0].throughput = 0;
+    curves[0].samples[0].esn0 = 3;
+    EXPECT_EQ(quantitiesOf(curves), (std::vector<const Quantity*>{&blockErrorRate, &throughput}));
+    EXPECT_TRUE(throughput.of(curves[0].samples[0]).canBeDrawn()) << "its axis is linear";
+    EXPECT_EQ(viewsOf(curves)[0].axis, &esn0Axis);
+    curves[0].reference = true;
+    EXPECT_EQ(viewsOf(curves)[0].axis, &ebn0Axis);
+}
+
 TEST(Series, ReferencesAreBehindTheOthers)
 {
     const auto ordered = inOrder({reference, curve, reference, farCurve});
