@@ -2,6 +2,7 @@
 #include <CLI/CLI.hpp>
 #include <iomanip>
 #include <iostream>
+#include <numeric>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -9,6 +10,8 @@
 #include "Measure.h"
 #include "Options.h"
 #include "link/FrameSource.h"
+#include "link/RatioScale.h"
+#include "link/TransportSource.h"
 #include "support/Blocks.h"
 
 #include "morvik_v1_0_batch.h"
@@ -23,6 +26,24 @@ constexpr double scale = 8;
 constexpr std::uint64_t seed = 1;
 constexpr int units = 4;
 constexpr int algorithm = 1;
+
+/// Cycles per information bit of a stage, the median of the repetitions.
+template <class Stages>
+double cyclesOf(Stages& stages, void (Stages::*stage)(), double bits, const morvik::bench::Options& options)
+{
+    const morvik::bench::Stopwatch once;
+    (stages.*stage)();
+    const auto calls = static_cast<unsigned>(options.seconds / once.stop(1).seconds) + 1;
+    std::vector<double> samples;
+    for (unsigned i = 0; i < options.repetitions; ++i) {
+        const morvik::bench::Stopwatch stopwatch;
+        for (unsigned call = 0; call < calls; ++call) {
+            (stages.*stage)();
+        }
+        samples.push_back(stopwatch.stop(calls).cycles / bits);
+    }
+    return morvik::bench::median(samples);
+}
 
 /// Frames of one size, made and decoded `count` at a time, in separate stages or as a whole.
 class Stages {
@@ -80,23 +101,6 @@ public:
         decodeBy(itsDecoder);
     }
 
-    /// Cycles per information bit, the median of the repetitions.
-    double cycles(void (Stages::*stage)(), const morvik::bench::Options& options)
-    {
-        const morvik::bench::Stopwatch once;
-        (this->*stage)();
-        const auto calls = static_cast<unsigned>(options.seconds / once.stop(1).seconds) + 1;
-        std::vector<double> samples;
-        for (unsigned i = 0; i < options.repetitions; ++i) {
-            const morvik::bench::Stopwatch stopwatch;
-            for (unsigned call = 0; call < calls; ++call) {
-                (this->*stage)();
-            }
-            samples.push_back(stopwatch.stop(calls).cycles / (double{1} * itsK * itsCount));
-        }
-        return morvik::bench::median(samples);
-    }
-
 private:
     /// The components define the decisions.
     void checkDecisions(const std::string& instructionSet)
@@ -145,6 +149,106 @@ private:
     std::vector<std::uint8_t> itsDecisions;
 };
 
+/// Transport blocks of one code block, made and decoded together.
+class TransportStages {
+public:
+    TransportStages(Modulation modulation, double rate, int milliEsn0, const SamplerForm& form)
+        : itsSource(settingOf(modulation, rate, milliEsn0), seed, form), itsDecoder(units, algorithm)
+    {
+        veltra_ip_morvik_v1_0_set_instruction_set(itsDecoder.state(), form.name);
+        std::iota(itsFrames.begin(), itsFrames.end(), 0U);
+        make();
+    }
+
+    void begin()
+    {
+        itsSource.begin(0, blocks);
+    }
+
+    /// All transmissions' work: symbols, noise, ratios, soft values.
+    void transmit()
+    {
+        itsSource.transmit(itsFrames, 0, itsBatches, itsClipped.data());
+    }
+
+    void make()
+    {
+        begin();
+        transmit();
+    }
+
+    void decode()
+    {
+        const CodeBlockBatch& batch = itsBatches[1];
+        itsDecisions.resize(std::size_t{blocks} * batch.K);
+        veltra_ip_morvik_v1_0_batch_outputs outputs = {};
+        outputs.dout = itsDecisions.data();
+        outputs.dout_alloc = itsDecisions.size();
+        veltra_ip_morvik_v1_0_batch_simulate_i8(itsDecoder.state(),
+                                                batch.streams[0].data(),
+                                                batch.streams[1].data(),
+                                                batch.streams[2].data(),
+                                                static_cast<std::int32_t>(batch.K + morvik::rules::tailPositions),
+                                                blocks,
+                                                morvik::bench::iterations,
+                                                nullptr,
+                                                &outputs);
+    }
+
+    static constexpr unsigned bits = 6120;  // and 24 of the CRC
+    static constexpr unsigned blocks = 64;
+
+private:
+    static TransportSetting settingOf(Modulation modulation, double rate, int milliEsn0)
+    {
+        TransportSetting setting;
+        setting.bits = bits;
+        const unsigned perSymbol = bitsPerSymbol(modulation);
+        setting.codedBits = static_cast<unsigned>(bits / rate) / perSymbol * perSymbol;
+        setting.symbols = {modulation, Fading::none, Demapper::maxLog, milliEsn0};
+        setting.versions = {0};
+        setting.scales = {ratioScale(algorithm, modulation, rate)};
+        return setting;
+    }
+
+    TransportSource itsSource;
+    morvik::blocks::Decoder itsDecoder;
+    std::vector<unsigned> itsFrames = std::vector<unsigned>(blocks);
+    std::vector<std::uint32_t> itsClipped = std::vector<std::uint32_t>(blocks);
+    std::array<CodeBlockBatch, 2> itsBatches;
+    std::vector<std::uint8_t> itsDecisions;
+};
+
+void measureTransportBlocks(const morvik::bench::Options& options)
+{
+    std::cout << "\nTransport blocks of one code block of 6144 bits, likewise\n\n"
+              << "| modulation | rate | instructions | bits, code | symbols, soft values | make, in all | decode | "
+                 "make / decode |\n"
+              << "|------------|-----:|--------------|-----------:|---------------------:|-------------:|-------:|-----"
+                 "---------:|\n";
+    struct Line {
+        Modulation modulation;
+        double rate;
+        int milliEsn0;
+    };
+    for (const SamplerForm& form : samplerForms()) {
+        for (const Line& line : {Line{Modulation::qpsk, 1.0 / 3, -1000}, Line{Modulation::qam64, 0.75, 15800}}) {
+            TransportStages stages(line.modulation, line.rate, line.milliEsn0, form);
+            constexpr double bits = double{TransportStages::bits} * TransportStages::blocks;
+            const double begin = cyclesOf(stages, &TransportStages::begin, bits, options);
+            const double transmit = cyclesOf(stages, &TransportStages::transmit, bits, options);
+            const double make = cyclesOf(stages, &TransportStages::make, bits, options);
+            const double decode = cyclesOf(stages, &TransportStages::decode, bits, options);
+            std::cout << "| " << std::left << std::setw(10) << nameOf(line.modulation) << " | " << std::right
+                      << std::setw(4) << line.rate << " | " << std::left << std::setw(12) << form.name << std::right
+                      << " | " << std::setw(10) << begin << " | " << std::setw(20) << transmit << " | " << std::setw(12)
+                      << make << " | " << std::setw(6) << decode << " | " << std::setw(11) << 100 * make / decode
+                      << " % |\n"
+                      << std::flush;
+        }
+    }
+}
+
 void measure(const morvik::bench::Options& options)
 {
     std::cout
@@ -157,10 +261,11 @@ void measure(const morvik::bench::Options& options)
         for (const unsigned K : {6144U, 512U, 40U}) {
             for (const unsigned count : {64U, 16U}) {
                 Stages stages(K, count, form);
-                const double encode = stages.cycles(&Stages::encode, options);
-                const double receive = stages.cycles(&Stages::receive, options);
-                const double make = stages.cycles(&Stages::make, options);
-                const double decode = stages.cycles(&Stages::decode, options);
+                const double bits = double{1} * K * count;
+                const double encode = cyclesOf(stages, &Stages::encode, bits, options);
+                const double receive = cyclesOf(stages, &Stages::receive, bits, options);
+                const double make = cyclesOf(stages, &Stages::make, bits, options);
+                const double decode = cyclesOf(stages, &Stages::decode, bits, options);
                 std::cout << "| " << std::setw(4) << K << " | " << std::setw(13) << count << " | " << std::left
                           << std::setw(12) << form.name << std::right << " | " << std::setw(6) << encode << " | "
                           << std::setw(11) << receive << " | " << std::setw(12) << make << " | " << std::setw(6)
@@ -183,6 +288,7 @@ int main(int argc, char** argv)
     CLI11_PARSE(app, argc, argv);
     try {
         measure(options);
+        measureTransportBlocks(options);
     } catch (const std::exception& error) {
         std::cerr << "morvik_bench_frames: " << error.what() << '\n';
         return 1;

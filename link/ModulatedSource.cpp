@@ -82,10 +82,13 @@ void ModulatedSource::receive(std::uint64_t frame, unsigned i, std::size_t place
         copyBits(itsStreams[s].block(i), 0, positions, itsCoded.data(), s * positions);
     }
     itsLink.receive(frame, 0, itsCoded.data(), itsSentBits, itsRatios.data());
+    frames.clipped[place] = 0;
     for (unsigned s = 0; s < 3; ++s) {
-        softValues(&itsRatios[s * positions], positions, itsScale, &frames.streams[s][place * positions]);
+        const float* const ratios = &itsRatios[s * positions];
+        std::int8_t* const values = &frames.streams[s][place * positions];
+        softValues(ratios, positions, itsScale, values);
+        frames.clipped[place] += clippedIn(ratios, positions, itsScale, values);
     }
-    frames.clipped[place] = clippedIn(itsRatios.data(), 3 * positions, itsScale);
 }
 
 }  // namespace morvik::link

@@ -20,12 +20,21 @@ std::uint64_t keyWordOf(const SymbolFormat& format)
     return kind << 32 | static_cast<std::uint32_t>(format.milliDecibels);
 }
 
-std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale)
+std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale, const std::int8_t* values)
 {
+    // Only values at the ends can be, and most runs of values have none.
+    constexpr std::size_t part = 64;
     std::uint32_t clipped = 0;
-    for (std::size_t i = 0; i < count; ++i) {
-        const float steps = ratios[i] * scale;
-        clipped += steps >= 127.5F || steps <= -128.5F ? 1U : 0U;
+    for (std::size_t first = 0; first < count; first += part) {
+        const std::size_t end = std::min(first + part, count);
+        std::uint8_t atEnds = 0;
+        for (std::size_t i = first; i < end; ++i) {
+            atEnds = static_cast<std::uint8_t>(atEnds | (values[i] == 127) | (values[i] == -128));
+        }
+        for (std::size_t i = first; atEnds != 0 && i < end; ++i) {
+            const float steps = ratios[i] * scale;
+            clipped += steps >= 127.5F || steps <= -128.5F ? 1U : 0U;
+        }
     }
     return clipped;
 }

@@ -23,8 +23,8 @@ struct SymbolFormat {
 /// What tells the random numbers of points with different formats apart. The receiver's choices do not.
 std::uint64_t keyWordOf(const SymbolFormat& format);
 
-/// How many ratios, times scale, lie outside what soft values can be.
-std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale);
+/// How many soft values were clipped: those of ratios that, times scale, lie outside their range.
+std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale, const std::int8_t* values);
 
 class SymbolLink {
 public:

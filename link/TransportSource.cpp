@@ -108,7 +108,7 @@ std::uint32_t TransportSource::recover(unsigned frame, unsigned transmission)
     itsCode.recover(itsRatios.data(), itsSetting.versions[transmission], buffer);
     const auto scale = static_cast<float>(itsSetting.scales[transmission]);
     softValues(buffer, itsCode.softSize(), scale, itsValues.data());
-    return clippedIn(buffer, itsCode.softSize(), scale);
+    return clippedIn(buffer, itsCode.softSize(), scale, itsValues.data());
 }
 
 /// The same with a soft buffer of few bits. What it holds at an end of its range counts as clipped.

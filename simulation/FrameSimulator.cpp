@@ -52,7 +52,7 @@ void FrameSimulator::prepareFor(std::size_t point)
         itsCore.emplace(next.numPu, next.algorithm, itsInstructionSet);
     }
     if (next.link.hasTransportBlocks()) {
-        itsSimulator = std::make_unique<TransportSimulator>(itsPlan, next, *itsCore);
+        itsSimulator = std::make_unique<TransportSimulator>(itsPlan, next, *itsCore, itsInstructionSet);
     } else {
         itsSimulator = std::make_unique<BlockSimulator>(itsPlan, next, *itsCore);
     }

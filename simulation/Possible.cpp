@@ -38,8 +38,8 @@ std::optional<std::string> impossibleReception(std::uint64_t blocks, const Point
         return cannotBe("sent_transmissions", reception.transmissions, ofBlocks);
     }
     const std::uint64_t decodings = reception.transmissions * codeBlocks;
-    if (reception.iterations < decodings || reception.iterations > decodings * point.iterations ||
-        (!point.link.stopsEarly && reception.iterations < decodings * point.iterations)) {
+    const std::uint64_t least = point.link.stopsEarly ? 1 : point.iterations;
+    if (reception.iterations / least < decodings || isMoreThan(reception.iterations, decodings, point.iterations)) {
         return cannotBe("run_iterations", reception.iterations, std::to_string(decodings) + " decoded code blocks");
     }
     if (reception.codeBlockErrors < errors.blockErrors ||

@@ -40,8 +40,16 @@ link::TransportSetting settingOf(const Point& point)
 
 }  // namespace
 
-TransportSimulator::TransportSimulator(const Plan& plan, const Point& point, Core& core)
-    : itsPlan(plan), itsPoint(point), itsCore(core), itsSource(settingOf(point), plan.seed), itsCheck(itsSource)
+TransportSimulator::TransportSimulator(const Plan& plan,
+                                       const Point& point,
+                                       Core& core,
+                                       const std::string& instructionSet)
+    : itsPlan(plan),
+      itsPoint(point),
+      itsCore(core),
+      itsSmallCore(point.numPu, point.algorithm, instructionSet),
+      itsSource(settingOf(point), plan.seed),
+      itsCheck(itsSource)
 {
 }
 
@@ -139,9 +147,14 @@ void TransportSimulator::decode(const std::vector<unsigned>& frames, unsigned it
     }
 }
 
+Core& TransportSimulator::coreOf(const link::CodeBlockBatch& batch)
+{
+    return batch.K == itsPoint.blockSize ? itsCore : itsSmallCore;
+}
+
 void TransportSimulator::decodeBatch(const link::CodeBlockBatch& batch, unsigned iterations)
 {
-    itsCore.decode(batch.streams, batch.K, batch.places.size(), iterations, itsDecided);
+    coreOf(batch).decode(batch.streams, batch.K, batch.places.size(), iterations, itsDecided);
     for (std::size_t i = 0; i < batch.places.size(); ++i) {
         judge(batch.places[i], &itsDecided[i * batch.K], iterations, true);
     }
@@ -153,7 +166,7 @@ void TransportSimulator::decodeUntilItFits(const link::CodeBlockBatch& batch, un
     itsOpen = batch;
     const std::size_t length = batch.K + rules::tailPositions;
     for (unsigned i = 1; i <= iterations && !itsOpen.places.empty(); ++i) {
-        itsCore.decode(itsOpen.streams, batch.K, itsOpen.places.size(), i, itsDecided);
+        coreOf(batch).decode(itsOpen.streams, batch.K, itsOpen.places.size(), i, itsDecided);
         std::size_t kept = 0;
         for (std::size_t b = 0; b < itsOpen.places.size(); ++b) {
             if (judge(itsOpen.places[b], &itsDecided[b * batch.K], i, i == iterations)) {

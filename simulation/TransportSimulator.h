@@ -14,7 +14,7 @@ namespace morvik::simulation {
 class TransportSimulator : public PointSimulator {
 public:
     /// Plan, point and core must outlive the simulator.
-    TransportSimulator(const Plan& plan, const Point& point, Core& core);
+    TransportSimulator(const Plan& plan, const Point& point, Core& core, const std::string& instructionSet);
 
     std::uint32_t framesAtOnce() const override;
     void simulate(std::uint64_t first, std::uint32_t count, BatchResult& result) override;
@@ -31,6 +31,7 @@ private:
 
     void transmit(const std::vector<unsigned>& frames, unsigned transmission, std::vector<std::uint32_t>& clipped);
     void decode(const std::vector<unsigned>& frames, unsigned iterations);
+    Core& coreOf(const link::CodeBlockBatch& batch);
     void decodeBatch(const link::CodeBlockBatch& batch, unsigned iterations);
     void decodeUntilItFits(const link::CodeBlockBatch& batch, unsigned iterations);
     bool judge(const link::CodeBlockBatch::Place& place, const std::uint8_t* decided, unsigned iterations, bool isLast);
@@ -39,6 +40,7 @@ private:
     const Plan& itsPlan;
     const Point& itsPoint;
     Core& itsCore;
+    Core itsSmallCore;  // for the smaller size, as a core prepares for a size anew whenever that changes
     link::TransportSource itsSource;
     TransportCheck itsCheck;
     std::array<link::CodeBlockBatch, 2> itsBatches;

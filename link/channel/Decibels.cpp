@@ -60,7 +60,7 @@ double ratioOf(int milliDecibels)
                          fractions[3][rest % 10];
     // Powers of ten up to 10^22 are exact.
     double power = 1;
-    int decades = (milliDecibels - rest) / decade;
+    int decades = milliDecibels / decade - (milliDecibels % decade < 0 ? 1 : 0);
     const bool isSmall = decades < 0;
     for (decades = isSmall ? -decades : decades; decades > 0; --decades) {
         power *= 10;

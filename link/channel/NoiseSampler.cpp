@@ -71,17 +71,14 @@ void NoiseSampler::drawPart(const FrameRandom& random, std::uint32_t first, std:
     itsCoarse.draw();
 
     itsFine.clear();
-    for (std::uint32_t i = 0; i < count; i += 8) {
-        itsFine.put(random.counterLow(random_index::fineNoise + (first + i) / 8), random.counterHigh());
-    }
+    itsFine.put(random.counterLow(random_index::fineNoise + first / 8), random.counterHigh(), (count + 7) / 8);
     itsFine.draw();
-    for (std::uint32_t i = 0; i < count; i += 8) {
-        const std::uint64_t u = itsFine.low(i / 8);
-        const std::uint64_t v = itsFine.high(i / 8);
-        for (std::uint32_t j = 0; j < std::min(8U, count - i); ++j) {
-            const auto fine = static_cast<int>((u >> 8 * j & 0xFF) + (v >> 8 * j & 0xFF));
-            numbers[i + j] = static_cast<std::int16_t>(256 * itsSteps[i + j] + fine - 255);
-        }
+    // Byte i % 8 of a word belongs to number i.
+    const auto* const u = reinterpret_cast<const std::uint8_t*>(itsFine.lows());
+    const auto* const v = reinterpret_cast<const std::uint8_t*>(itsFine.highs());
+    const std::int8_t* const steps = itsSteps.data();
+    for (std::uint32_t i = 0; i < count; ++i) {
+        numbers[i] = static_cast<std::int16_t>(256 * steps[i] + u[i] + v[i] - 255);
     }
 }
 

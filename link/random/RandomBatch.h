@@ -22,6 +22,17 @@ public:
         itsHigh.clear();
     }
 
+    /// Adds `count` consecutive counters.
+    void put(std::uint64_t counterLow, std::uint64_t counterHigh, std::size_t count)
+    {
+        const std::size_t before = itsLow.size();
+        itsLow.resize(before + count);
+        itsHigh.resize(before + count, counterHigh);
+        for (std::size_t i = 0; i < count; ++i) {
+            itsLow[before + i] = counterLow + i;
+        }
+    }
+
     void put(std::uint64_t counterLow, std::uint64_t counterHigh)
     {
         itsLow.push_back(counterLow);
@@ -43,6 +54,16 @@ public:
     std::uint64_t high(std::size_t i) const
     {
         return itsHigh[i];
+    }
+
+    /// All of them, of each counter words 0 and 1, or words 2 and 3.
+    const std::uint64_t* lows() const
+    {
+        return itsLow.data();
+    }
+    const std::uint64_t* highs() const
+    {
+        return itsHigh.data();
     }
 
 private:
