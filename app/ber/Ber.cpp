@@ -145,15 +145,19 @@ int ber(const BerMeans& means, const BerOptions& options)
 
 /// The end of the help text.
 constexpr char explanation[] =
-    R"(Simulates every combination of the options that take lists, with BPSK over white Gaussian
-noise; Eb/N0 counts the tail, at a rate of K / (3 K + 12). The same seed gives the same
+    R"(Simulates every combination of the options that take lists: plain code blocks, with BPSK over
+white Gaussian noise unless another modulation or channel is named, or transport blocks of
+3GPP TS 36.212. Eb/N0 counts tail and CRCs as energy, not as information. The same seed gives the same
 results whatever the number of threads or the machine. docs/error_rates.md tells the rest.
 
 Exit status: 0 all simulated, 2 bad input or usage, 128 and the signal's number when a
 signal ended the run; --resume goes on then, as it does after a crash.
 
 Example: the waterfall of 512 bits after four and after eight iterations
-  morvik ber --block-size 512 --iterations 4,8 --output k512.csv)";
+  morvik ber --block-size 512 --iterations 4,8 --output k512.csv
+
+Example: the throughput of each MCS
+  morvik ber --mcs 0:28 --resource-blocks 6 --plot mcs.svg)";
 
 }  // namespace
 
