@@ -25,6 +25,11 @@ const Arguments manyPoints = words(
 /// A point with as many frames as some batches have.
 const Arguments eachIteration = words("--block-size 512 --ebn0 0.7 --frames 7:5000 --iterations 3 --each-iteration");
 
+/// Transport blocks, with retransmissions.
+const Arguments transportBlocks = words(
+    "--transport-block-size 200 --coded-bits 400 --modulation 16qam --redundancy-versions 0,2 --esn0 4:0.5:6 "
+    "--max-blocks 3000");
+
 /// A point that takes a second or more.
 const Arguments longPoint = words("--block-size 512 --ebn0 1.4 --frames 0:400000");
 
@@ -161,13 +166,14 @@ const Arguments neverSaved = {"--checkpoint-interval", "24h"};
 
 TEST_F(MpiRuns, GiveTheSameFilesForAnyNumberOfRanks)
 {
-    for (const auto& [file, run] : {std::pair("a.csv", manyPoints), std::pair("a.json", eachIteration)}) {
+    for (const auto& [file, run] :
+         {std::pair("a.csv", manyPoints), std::pair("a.json", eachIteration), std::pair("b.csv", transportBlocks)}) {
         const std::string expected = berFile(run, file);
         for (const int count : {1, 2, 4}) {
             EXPECT_EQ(mpiFile(count, run, file), expected) << count;
         }
     }
-    EXPECT_EQ(mpirun.names(), (Arguments{"a.csv", "a.json"}));
+    EXPECT_EQ(mpirun.names(), (Arguments{"a.csv", "a.json", "b.csv"}));
 }
 
 TEST_F(MpiRuns, GiveTheSameFilesForAnyNumberOfThreads)
