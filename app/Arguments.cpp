@@ -31,7 +31,7 @@ CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max)
     const auto check = [min, max](std::string& text) -> std::string {
         const auto value = base::parseNumber<std::uint32_t>(text);
         if (!value || *value < min || *value > max) {
-            return base::shown(text) + " is not allowed, allowed are the integers " + std::to_string(min) + " to " +
+            return base::shown(text) + " is not allowed, expected an integer from " + std::to_string(min) + " to " +
                    std::to_string(max);
         }
         text = std::to_string(*value);
@@ -49,9 +49,10 @@ CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& cho
                 text = value;
                 return {};
             }
-            allowed += (allowed.empty() ? "" : ", ") + choice;
+            const bool isLast = choice == choices.back().first;
+            allowed += (allowed.empty() ? "" : isLast ? " or " : ", ") + choice;
         }
-        return base::shown(text) + " is not allowed, allowed are " + allowed;
+        return base::shown(text) + " is not allowed, expected " + allowed;
     };
     std::vector<std::string> words;
     words.reserve(choices.size());
@@ -98,7 +99,7 @@ std::string blockSizesNear(std::uint32_t K)
 {
     const auto& sizes = rules::blockSizes;
     if (K < sizes.front().K || K > sizes.back().K) {
-        return "allowed are the block sizes of 3GPP TS 36.212, " + std::to_string(sizes.front().K) + " to " +
+        return "expected a block size of 3GPP TS 36.212, " + std::to_string(sizes.front().K) + " to " +
                std::to_string(sizes.back().K);
     }
     const auto* const above =
@@ -121,7 +122,7 @@ int readMilliDecibels(const std::string& option, const std::string& text, const 
     constexpr int largest = 50000;
     const auto value = base::parseThousandths(text);
     if (!value || *value < -largest || *value > largest) {
-        refuse(option, text, "allowed are -50 to 50 dB, with at most three decimals" + otherwise);
+        refuse(option, text, "expected -50 to 50 dB, with at most three decimals" + otherwise);
     }
     return *value;
 }

@@ -30,7 +30,7 @@ void expectBits(const base::LineReader& lines)
     const std::size_t other = lines.text().find_first_not_of("01");
     if (other != std::string_view::npos) {
         lines.fail("character " + base::shown(lines.text().substr(other, 1)) + " in column " +
-                   std::to_string(other + 1) + ", allowed are 0 and 1");
+                   std::to_string(other + 1) + ", expected 0 or 1");
     }
 }
 

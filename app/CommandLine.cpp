@@ -23,7 +23,7 @@ int reportUsage(const CLI::App& app, const CLI::ParseError& error)
 {
     const auto named = app.get_subcommands();
     const std::string name = named.empty() ? app.get_name() : app.get_name() + ' ' + named.front()->get_name();
-    return fail(name, std::string(error.what()) + "; '" + name + " --help' tells what is allowed");
+    return fail(name, std::string(error.what()) + "; see '" + name + " --help'");
 }
 
 /// Flushes standard output; a failure would otherwise go unnoticed. Returns the exit status.

@@ -37,7 +37,7 @@ void check(const diagnosis::Case& read, const SoftValueReader& blocks, const Ref
 {
     const std::size_t K = read.sent.size();
     if (rules::findBlockSize(static_cast<std::uint32_t>(K)) == nullptr) {
-        reference.fail(std::to_string(K) + " bits, allowed are the block sizes of 3GPP TS 36.212 (40 to 6144)");
+        reference.fail(std::to_string(K) + " bits, expected a block size of 3GPP TS 36.212 (40 to 6144)");
     }
     if (read.received.size() < K) {
         blocks.failBlock("block of " + std::to_string(read.received.size()) + " rows for " + std::to_string(K) +
@@ -95,13 +95,13 @@ int examine(const Options& options)
 
 Command addDoctor(CLI::App& app)
 {
-    CLI::App* command = app.add_subcommand("doctor", "Tell why blocks of soft values decode badly");
+    CLI::App* command = app.add_subcommand("doctor", "Find out why blocks of soft values decode badly");
     const auto options = std::make_shared<Options>();
 
     command->add_option("FILE", options->input, "Soft values, as 'morvik decode' takes them; - for standard input")
         ->type_name("")
         ->capture_default_str();
-    command->add_option("--reference", options->reference, "The bits that were sent, one line for each block")
+    command->add_option("--reference", options->reference, "Bits that were sent, one line for each block")
         ->type_name("FILE")
         ->required();
     command->add_option("--blocks", options->blocks, "Look at the first N blocks")
@@ -110,11 +110,11 @@ Command addDoctor(CLI::App& app)
         ->capture_default_str();
     command->add_flag("--json", options->json, "Print a JSON object instead of text");
     addDecoderOptions(*command, options->decoder);
-    command->footer(R"(Looks for a flipped sign, swapped columns, another order of the tail, rows or bits in reversed
-order, a missing or doubled scale, and missing or additional rows, by themselves and together.
+    command->footer(R"(Looks for flipped signs, swapped columns, a wrong tail order, reversed rows or bits, a missing or
+doubled scale, missing or extra rows, and combinations of these.
 
 Exit status: 0 all blocks decode and nothing is wrong, 1 a mistake was found, 2 bad input or usage,
-3 blocks fail and no mistake was found: they are too noisy, or the bits are not theirs.
+3 blocks fail but no mistake was found: too much noise, or bits of other blocks.
 
 Example:
   morvik doctor received.csv --reference sent.bits)");

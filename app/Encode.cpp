@@ -68,7 +68,7 @@ void encodeCodeBlocks(const Options& options, BitLines& lines, base::OutputFile&
         const auto K = static_cast<unsigned>(lines.text().size());
         if (rules::findBlockSize(K) == nullptr) {
             lines.fail(base::counted(K, "bit") +
-                       ", allowed are the block sizes of 3GPP TS 36.212, 40 to 6144; --transport-block takes others");
+                       ", expected a block size of 3GPP TS 36.212, 40 to 6144; --transport-block takes others");
         }
         link::TurboEncoder& encoder = encoders.try_emplace(K, K).first->second;
         encoder.encode(packed(bitsOf(lines.text()), encoder.words()), 1, streams);

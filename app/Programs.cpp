@@ -24,7 +24,9 @@ Program morvikProgram()
 {
     Program program("morvik", "The bit-accurate model of the morvik LTE turbo decoder, at the command line.");
     CLI::App& app = *program.arguments;
-    app.footer("Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' tells the rest.");
+    app.footer(
+        "Example:\n  morvik decode k40.csv --reference k40.bits\n\n'morvik SUBCOMMAND --help' describes each "
+        "subcommand.");
     program.commands = {
         addDecode(app),
         addEncode(app),

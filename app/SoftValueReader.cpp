@@ -49,7 +49,7 @@ bool SoftValueReader::next(SoftBlock& block)
     const std::string label = itsLabel;
     while (!itsAtEnd && itsLabel == label) {
         if (block.size() == maxPositions) {
-            failBlock("block of more than " + std::to_string(maxPositions) + " rows, allowed are " + allowedRows);
+            failBlock("block of more than " + std::to_string(maxPositions) + " rows, expected " + allowedRows);
         }
         appendRow(block);
         advance();
@@ -87,7 +87,7 @@ void SoftValueReader::readLabel()
     }
     itsLabel = itsRow.fields().front();
     if (!isLabel(itsLabel)) {
-        itsLines.fail("block " + base::shown(itsLabel) + " is no label, allowed are non-negative integers");
+        itsLines.fail("block " + base::shown(itsLabel) + " is not a label, expected a non-negative integer");
     }
 }
 
@@ -108,7 +108,7 @@ std::int32_t SoftValueReader::value(std::size_t column) const
     const auto value = base::parseNumber<std::int32_t>(field);
     if (!value) {
         itsLines.fail(std::string(base::fieldsOf(softValueHeader)[column]) + ' ' + base::shown(field) +
-                      " is not allowed, allowed are the integers -2147483648 to 2147483647");
+                      " is not allowed, expected an integer from -2147483648 to 2147483647");
     }
     return *value;
 }
@@ -126,7 +126,7 @@ SoftBlock readBlock(const std::string& file, std::uint32_t number)
     }
     if (block.size() < rules::tailPositions ||
         rules::findBlockSize(static_cast<std::uint32_t>(block.size() - rules::tailPositions)) == nullptr) {
-        reader.failBlock("block of " + std::to_string(block.size()) + " rows, allowed are " + allowedRows);
+        reader.failBlock("block of " + std::to_string(block.size()) + " rows, expected " + allowedRows);
     }
     return block;
 }

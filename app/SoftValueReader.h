@@ -20,7 +20,7 @@ namespace morvik {
 constexpr char softValueHeader[] = "block,rsc1_sys,rsc1_par,rsc2_par";
 
 /// The allowed numbers of rows in a block, for messages.
-constexpr char allowedRows[] = "K + 4 rows, K being one of the block sizes of 3GPP TS 36.212 (40 to 6144)";
+constexpr char allowedRows[] = "K + 4 rows, where K is a block size of 3GPP TS 36.212 (40 to 6144)";
 
 /// Whether the text is a block's label: a non-negative integer of any length.
 bool isLabel(std::string_view text);

@@ -47,8 +47,8 @@ void selectPasses(const Options& options, trace::Selection& selection)
     const auto last = base::parseNumber<std::uint32_t>(ends.back());
     if (ends.size() > 2 || !first || !last || *first > *last || *last >= passes) {
         throw base::Error("--half-iterations: " + base::shown(options.halfIterations) +
-                          " is not allowed, allowed are N and A:B, A not above B, from 0 to " +
-                          std::to_string(passes - 1) + " (two for each of --iterations)");
+                          " is not allowed, expected N or A:B, A not above B, from 0 to " + std::to_string(passes - 1) +
+                          " (two for each of --iterations)");
     }
     selection.first = *first;
     selection.last = *last;
@@ -87,7 +87,7 @@ void appendSignals(const std::string& text, std::vector<unsigned>& signals)
         }
     }
     if (signals.size() == before) {
-        refuse("--signals", text, "known are " + knownSignals(", and "));
+        refuse("--signals", text, "expected " + knownSignals(", or "));
     }
 }
 
@@ -107,7 +107,7 @@ void appendUnit(const std::string& text, std::vector<std::uint32_t>& units)
 {
     const auto unit = base::parseNumber<std::uint32_t>(text);
     if (!unit) {
-        refuse("--units", text, "allowed are numbers of units, from 0");
+        refuse("--units", text, "expected unit numbers, from 0");
     }
     units.push_back(*unit);
 }
@@ -127,10 +127,10 @@ void checkUnits(const Options& options, const rules::Cut& cut)
 
 base::OutputFile openOutput(const Options& options)
 {
-    base::expectOwnFile(options.output, {options.input}, "its traced values");
+    base::expectOwnFile(options.output, {options.input}, "traced values");
     base::OutputFile file(options.output);
     if (options.format == "npy" && !file.isReplaced()) {
-        throw base::Error("--format npy needs a regular file, by --output FILE");
+        throw base::Error("--format npy needs a regular file; use --output FILE");
     }
     return file;
 }
@@ -151,7 +151,8 @@ void write(Options options)
     trace::Selection& selection = options.selection;
     selectPasses(options, selection);
     if (options.format == "text" && (!selection.signals.empty() || !selection.units.empty())) {
-        throw base::Error("--signals and --units need --format csv, vcd or npy: the text is the library's own");
+        throw base::Error(
+            "--signals and --units need --format csv, vcd or npy: they do not apply to the library's own text");
     }
     const SoftBlock block = readBlock(options.input, options.block);
     if (options.format == "text") {
@@ -182,9 +183,9 @@ int run(const Options& options)
 
 constexpr char explanationBeforeSignals[] =
     R"(FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
-interleaved constituent code. 'text' is the library's own trace; it lacks the branch metrics,
-which the other formats have. 'vcd' has a scope for each unit and thread; a unit of its time is
-a trellis step. docs/trace.md tells the rest.
+interleaved constituent code. 'text' is the library's own trace, which lacks the branch
+metrics. 'vcd' has a scope for each unit and thread, and one unit of time for each trellis step.
+docs/trace.md has the details.
 
 Signals: )";
 
@@ -197,13 +198,12 @@ Example: waveforms of the first iteration
 
 void addSelectionOptions(CLI::App& command, Options& options)
 {
-    command.add_option("--half-iterations", options.halfIterations, "Which passes to write, N or A:B; all without it")
+    command.add_option("--half-iterations", options.halfIterations, "Passes to write, N or A:B; default: all")
         ->type_name("A:B");
-    addListOption(
-        command, "--signals", options.selection.signals, appendSignals, "Which signals to write; all without it")
+    addListOption(command, "--signals", options.selection.signals, appendSignals, "Signals to write; default: all")
         ->check(offer(signalWords()))
         ->type_name("NAME[,NAME...]");
-    addListOption(command, "--units", options.selection.units, appendUnit, "Whose values to write; all without it")
+    addListOption(command, "--units", options.selection.units, appendUnit, "Units whose values to write; default: all")
         ->type_name("N[,N...]");
 }
 
@@ -211,12 +211,13 @@ void addSelectionOptions(CLI::App& command, Options& options)
 
 Command addTrace(CLI::App& app)
 {
-    CLI::App* command = app.add_subcommand("trace", "Write the values inside of chosen passes, as waveforms or tables");
+    CLI::App* command =
+        app.add_subcommand("trace", "Write the internal values of selected passes, as waveforms or tables");
     const auto options = std::make_shared<Options>();
     command->add_option("FILE", options->input, "Soft values, as CSV; - for standard input")
         ->type_name("")
         ->capture_default_str();
-    command->add_option("--block", options->block, "Which block of FILE, from 0")
+    command->add_option("--block", options->block, "Number of the block in FILE, from 0")
         ->transform(integerFrom(0, UINT32_MAX - 1))
         ->type_name("N")
         ->capture_default_str();

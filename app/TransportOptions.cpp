@@ -31,7 +31,7 @@ std::vector<unsigned> versionsOf(const std::string& text)
     for (const std::string& part : splitAt(',', text)) {
         const auto version = base::parseNumber<unsigned>(part);
         if (!version || *version >= link::redundancyVersions) {
-            refuse("--redundancy-version", text, "allowed are 0 to 3, or several of them with commas between");
+            refuse("--redundancy-version", text, "expected 0 to 3, or several with commas between them");
         }
         versions.push_back(*version);
     }

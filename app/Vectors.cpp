@@ -133,7 +133,8 @@ void expectNoOtherThanCheck(const CLI::App& command)
 {
     for (const CLI::Option* const option : command.get_options()) {
         if (option->count() > 0 && option->get_name() != "--check") {
-            throw base::Error(option->get_name() + " is for making a set, --check takes all from the manifest");
+            throw base::Error(option->get_name() +
+                              " cannot be combined with --check, which takes it from the manifest");
         }
     }
 }
@@ -145,15 +146,14 @@ int run(const CLI::App& command, const Options& options)
         return check(options.checked);
     }
     if (options.output.empty() || options.settings.blockSizes.empty()) {
-        throw base::Error(
-            "--out and --block-size, or --check, are required; 'morvik vectors --help' tells what is allowed");
+        throw base::Error("--out and --block-size, or --check, are required; see 'morvik vectors --help'");
     }
     return make(options);
 }
 
 void addBlockOptions(CLI::App& command, vectors::Settings& settings)
 {
-    addListOption(command, "--block-size", settings.blockSizes, appendBlockSize, "Bits of a block, K")
+    addListOption(command, "--block-size", settings.blockSizes, appendBlockSize, "Block size K in bits")
         ->check(offer(blockSizeWords()))
         ->type_name("K[,K...]");
     command.add_option("--blocks", settings.blocks, "Random blocks of each size")
@@ -173,11 +173,11 @@ void addBlockOptions(CLI::App& command, vectors::Settings& settings)
             [&settings](const std::string& text) {
                 const auto seed = base::parseNumber<std::uint64_t>(text);
                 if (!seed) {
-                    refuse("--seed", text, "allowed are the integers from 0 to 18446744073709551615");
+                    refuse("--seed", text, "expected an integer from 0 to 18446744073709551615");
                 }
                 settings.seed = *seed;
             },
-            "What bits and noise follow from")
+            "Seed of random bits and noise")
         ->type_name("N")
         ->default_str("1");
     command.add_flag_callback(
@@ -189,7 +189,7 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
     settings.formats = {"memh"};
     const auto append = [](const std::string& text, std::vector<std::string>& formats) {
         if (tables::findFormat(text) == nullptr) {
-            refuse("--format", text, "allowed are memh, csv, npy, c");
+            refuse("--format", text, "expected memh, csv, npy or c");
         }
         formats.push_back(text);
     };
@@ -197,28 +197,29 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
         ->check(offer({"memh", "csv", "npy", "c"}))
         ->type_name("FORMAT[,FORMAT...]")
         ->default_str("memh");
-    command.add_option("--width", settings.width, "Bits of a soft value in the files: 8, or 16 with the sign extended")
+    command.add_option("--width", settings.width, "Bits of a soft value in the files: 8, or 16 with sign extension")
         ->transform(oneOf({{"8", "8"}, {"16", "16"}}))
         ->type_name("BITS")
         ->capture_default_str();
     command
-        .add_option("--streams", settings.separateStreams, "packed: the streams in one memh file; separate: in three")
+        .add_option(
+            "--streams", settings.separateStreams, "packed: one memh file for all streams; separate: one for each")
         ->transform(oneOf({{"packed", "false"}, {"separate", "true"}}))
         ->type_name("HOW")
         ->default_str("packed");
-    command.add_flag("--soft", settings.ratios, "Expect log-likelihood ratios, too");
-    command.add_flag("--internal", settings.internal, "Expect every value of each pass, too");
+    command.add_flag("--soft", settings.ratios, "Add log-likelihood ratios to the expected values");
+    command.add_flag("--internal", settings.internal, "Add every value of each pass to the expected values");
 }
 
 constexpr char explanation[] =
-    R"(The folder holds the tables 'blocks', 'stimulus' and 'expected', each as a file of every
-format, and manifest.json with all parameters and the sha256 of each file. After the random
-blocks come directed ones: extremes, ties, sizes at which the core cuts blocks in another
-way, tags at the edges. docs/vectors.md tells the layout.
+    R"(The folder gets the tables 'blocks', 'stimulus' and 'expected', one file for each format, and
+manifest.json with all parameters and the SHA-256 of each file. Random blocks come first, then
+directed ones: extreme values, ties, sizes at which the division into segments and windows
+changes, extreme tags. docs/vectors.md describes the layout.
 
-Exit status: 0 made, or all as expected, 1 a difference found, 2 bad input or usage.
+Exit status: 0 written, or no difference, 1 a difference was found, 2 bad input or usage.
 
-Example: words for $readmemh, and the check of them
+Example: words for $readmemh, and a check of them
   morvik vectors --out k40 --block-size 40 --num-pu 8 --format memh,csv
   morvik vectors --check k40)";
 
@@ -229,9 +230,10 @@ Command addVectors(CLI::App& app)
     CLI::App* command = app.add_subcommand("vectors", "Make stimulus and expected values for a test bench");
     const auto options = std::make_shared<Options>();
     auto* output =
-        command->add_option("--out", options->output, "Folder for a new set of vectors, instead of an earlier one")
+        command
+            ->add_option("--out", options->output, "Write a new set of vectors to this folder; replaces an earlier one")
             ->type_name("DIR");
-    command->add_option("--check", options->checked, "Decode the set of vectors in the folder again, and compare")
+    command->add_option("--check", options->checked, "Decode the vectors in this folder again, and compare")
         ->type_name("DIR")
         ->excludes(output);
     addBlockOptions(*command, options->settings);

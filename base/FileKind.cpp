@@ -16,16 +16,16 @@ struct Kind {
 
 /// FST begins with a block of type 0 and 329 bytes or, compressed as a whole, with one of type 254.
 constexpr std::array<Kind, 10> kinds = {{
-    {"\x1F\x8B"sv, "is compressed by gzip; 'gunzip FILE' unpacks it"},
-    {"\xFD\x37zXZ\0"sv, "is compressed by xz; 'unxz FILE' unpacks it"},
-    {"\x28\xB5\x2F\xFD"sv, "is compressed by zstd; 'unzstd FILE' unpacks it"},
-    {"BZh"sv, "is compressed by bzip2; 'bunzip2 FILE' unpacks it"},
-    {"PK\x03\x04"sv, "is a ZIP archive; 'unzip FILE' unpacks it"},
-    {"\0\0\0\0\0\0\0\x01\x49"sv, "is an FST waveform; 'fst2vcd FILE > FILE.vcd' of GTKWave makes a VCD of it"},
-    {"\xFE\0\0\0"sv, "is an FST waveform; 'fst2vcd FILE > FILE.vcd' of GTKWave makes a VCD of it"},
-    {"GHDLwave"sv, "is a waveform of GHDL's own; run the simulation with --vcd=FILE"},
-    {"\xFF\xFE"sv, "is in UTF-16; 'iconv -f UTF-16 -t UTF-8 FILE > NEW' makes a text of it"},
-    {"\xFE\xFF"sv, "is in UTF-16; 'iconv -f UTF-16 -t UTF-8 FILE > NEW' makes a text of it"},
+    {"\x1F\x8B"sv, "is compressed with gzip; unpack it by 'gunzip FILE'"},
+    {"\xFD\x37zXZ\0"sv, "is compressed with xz; unpack it by 'unxz FILE'"},
+    {"\x28\xB5\x2F\xFD"sv, "is compressed with zstd; unpack it by 'unzstd FILE'"},
+    {"BZh"sv, "is compressed with bzip2; unpack it by 'bunzip2 FILE'"},
+    {"PK\x03\x04"sv, "is a ZIP archive; unpack it by 'unzip FILE'"},
+    {"\0\0\0\0\0\0\0\x01\x49"sv, "is an FST waveform; convert it by GTKWave's 'fst2vcd FILE > FILE.vcd'"},
+    {"\xFE\0\0\0"sv, "is an FST waveform; convert it by GTKWave's 'fst2vcd FILE > FILE.vcd'"},
+    {"GHDLwave"sv, "is in GHDL's own waveform format; run the simulation with --vcd=FILE"},
+    {"\xFF\xFE"sv, "is in UTF-16; convert it by 'iconv -f UTF-16 -t UTF-8 FILE > NEW'"},
+    {"\xFE\xFF"sv, "is in UTF-16; convert it by 'iconv -f UTF-16 -t UTF-8 FILE > NEW'"},
 }};
 
 }  // namespace

@@ -101,7 +101,7 @@ private:
         if (event == Event::object_start || event == Event::array_start) {
             open();
         } else if (event == Event::key && !itsOpen.back().insert(parsed.get<std::string>()).second) {
-            fail(behind(), shownValue(parsed) + " is there twice");
+            fail(behind(), shownValue(parsed) + " appears twice");
         }
     }
 
@@ -192,7 +192,7 @@ const Json& JsonMembers::at(const std::string& name) const
 std::string JsonMembers::text(const std::string& name) const
 {
     if (!at(name).is_string()) {
-        refuse(name, "expected a text");
+        refuse(name, "expected a string");
     }
     return at(name).get<std::string>();
 }
@@ -200,7 +200,7 @@ std::string JsonMembers::text(const std::string& name) const
 bool JsonMembers::flag(const std::string& name) const
 {
     if (!at(name).is_boolean()) {
-        refuse(name, "allowed are true and false");
+        refuse(name, "expected true or false");
     }
     return at(name).get<bool>();
 }
@@ -225,7 +225,7 @@ std::uint64_t JsonMembers::integer(const std::string& name, std::uint64_t lowest
 {
     const Json& value = at(name);
     if (!value.is_number_unsigned() || value.get<std::uint64_t>() < lowest || value.get<std::uint64_t>() > highest) {
-        refuse(name, "allowed are the integers " + std::to_string(lowest) + " to " + std::to_string(highest));
+        refuse(name, "expected an integer from " + std::to_string(lowest) + " to " + std::to_string(highest));
     }
     return value.get<std::uint64_t>();
 }

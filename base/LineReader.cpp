@@ -47,7 +47,7 @@ bool LineReader::next()
         itsText.remove_suffix(1);
     }
     if (itsText.size() > itsLongest) {
-        fail("line is too long, allowed are " + std::to_string(itsLongest) + " characters");
+        fail("line is longer than " + std::to_string(itsLongest) + " characters");
     }
     return true;
 }
@@ -60,7 +60,7 @@ std::string LineReader::place() const
 void LineReader::expectAnEnd(std::size_t first) const
 {
     if (itsNumber - first >= mostBlank) {
-        failAt(first, "blank lines without an end, allowed are " + std::to_string(mostBlank));
+        failAt(first, "more than " + std::to_string(mostBlank) + " blank lines");
     }
 }
 
@@ -69,7 +69,7 @@ void LineReader::expectOnlyBlankLines()
     const std::size_t first = itsNumber;
     while (next()) {
         if (!trimmed(itsText).empty()) {
-            failAt(first, "blank line, allowed at the end only");
+            failAt(first, "blank line before the end");
         }
         expectAnEnd(first);
     }

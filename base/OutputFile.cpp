@@ -246,7 +246,7 @@ void checkWritable(const std::string& name)
 {
     struct stat old = {};
     if (placeOf(name).descriptor || (stat(name.c_str(), &old) == 0 && !S_ISREG(old.st_mode))) {
-        throw Error(name + ": is no regular file, results need one");
+        throw Error(name + ": is not a regular file, as results need");
     }
     OutputFile{name};
 }

@@ -18,7 +18,7 @@ void refuseOtherThanFile(const std::string& fileName)
 {
     struct stat found = {};
     if (lstat(fileName.c_str(), &found) == 0 && !S_ISREG(found.st_mode)) {
-        throw Error(fileName + ": is no regular file, and is not replaced");
+        throw Error(fileName + ": is not a regular file and is not replaced");
     }
 }
 

@@ -31,10 +31,10 @@ std::string readText(std::istream& file, const std::string& name, std::size_t la
             throw Error(name + ": " + reason);
         }
         if (next.find('\0') != std::string_view::npos) {
-            throw Error(name + ": is no text, it has a null character");
+            throw Error(name + ": is not text, it has a null character");
         }
         if (text.size() + next.size() > largest) {
-            throw Error(name + ": is too large, allowed are " + std::to_string(largest) + " bytes");
+            throw Error(name + ": is larger than " + std::to_string(largest) + " bytes");
         }
         text += next;
     }
@@ -50,7 +50,7 @@ void expectRegularFile(const std::string& fileName)
     std::error_code none;  // set if there is no such file
     if (const auto found = std::filesystem::status(fileName, none);
         std::filesystem::exists(found) && !std::filesystem::is_regular_file(found)) {
-        throw Error(fileName + ": is no regular file");
+        throw Error(fileName + ": is not a regular file");
     }
 }
 

@@ -365,7 +365,7 @@ std::vector<Curve> numbered(const std::vector<Curve>& curves)
 void checkReport(const std::string& fileName)
 {
     if (std::filesystem::path(fileName).extension() != ".html") {
-        throw base::Error(fileName + ": is no name for a report, allowed are names that end in .html");
+        throw base::Error(fileName + ": is not a name for a report, expected one that ends in .html");
     }
     base::checkWritable(fileName);
 }

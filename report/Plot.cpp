@@ -26,7 +26,7 @@ std::string suffixOf(const std::string& fileName)
 {
     std::string suffix = std::filesystem::path(fileName).extension().string();
     if (suffix != ".svg" && suffix != ".png" && suffix != ".pdf") {
-        fail(fileName, "a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
+        fail(fileName, "a plot's format follows from its suffix, expected .svg, .png or .pdf");
     }
     return suffix;
 }
@@ -36,7 +36,7 @@ std::string lastLine(const std::string& messages)
 {
     const std::size_t end = messages.find_last_not_of(" \n");
     if (end == std::string::npos) {
-        return "gnuplot did not end well";
+        return "gnuplot failed";
     }
     const std::size_t start = messages.find_last_of('\n', end);
     const std::string line = messages.substr(start + 1, end - start);
@@ -54,7 +54,7 @@ std::string draw(const std::string& fileName, const std::string& script)
         return std::move(outcome.out);
     } catch (const std::system_error& error) {
         fail(fileName,
-             "is drawn by gnuplot (Debian's package gnuplot-nox), which cannot be started: " + error.code().message());
+             "needs gnuplot (Debian package gnuplot-nox), which cannot be started: " + error.code().message());
     }
 }
 

@@ -42,7 +42,7 @@ public:
             take(base::trimmed(itsLines.text()));
         }
         if (itsColumns.empty()) {
-            throw base::Error(itsName + ": has no line that names columns");
+            throw base::Error(itsName + ": has no header line");
         }
         if (itsRows.empty()) {
             throw base::Error(itsName + ": has no row of error rates");
@@ -58,7 +58,7 @@ private:
 
     [[noreturn]] void refuse(const std::string& column, const std::string& allowed) const
     {
-        fail(base::shown(text(column)) + " in the column " + column + " is not allowed, allowed are " + allowed);
+        fail(base::shown(text(column)) + " in the column " + column + " is not allowed, expected " + allowed);
     }
 
     void take(std::string_view line)
@@ -88,7 +88,7 @@ private:
         itsColumns.assign(names.begin(), names.end());
         for (std::size_t i = 0; i < names.size(); ++i) {
             if (!names[i].empty() && indexOf(std::string(names[i])) != i) {
-                fail("column " + base::shown(names[i]) + " is there twice");
+                fail("column " + base::shown(names[i]) + " appears twice");
             }
         }
         nameAlike("fer", "bler");
@@ -155,7 +155,7 @@ private:
     {
         const auto K = static_cast<unsigned>(count("block_size", UINT32_MAX));
         if (!text("block_size").empty() && rules::findBlockSize(K) == nullptr) {
-            refuse("block_size", "the block sizes of 3GPP TS 36.212, 40 to 6144");
+            refuse("block_size", "a block size of 3GPP TS 36.212, 40 to 6144");
         }
         return K;
     }
@@ -174,7 +174,7 @@ private:
     {
         const std::string seconds = text("seconds");
         if (!seconds.empty() && !simulation::isPossibleTime(base::parseNumber<double>(seconds).value_or(-1))) {
-            refuse("seconds", "the numbers from 0 to 1e+12");
+            refuse("seconds", "a number from 0 to 1e+12");
         }
         count("seed", UINT64_MAX);
         const std::string frames = text("frames");
@@ -183,7 +183,7 @@ private:
         }
         const auto ranges = simulation::FrameSet::parse(frames);
         if (!ranges || (blocks > 0 && ranges->size() != blocks)) {
-            refuse("frames", "a number, or ranges FROM:TO of as many frames as there are blocks");
+            refuse("frames", "a number, or ranges FROM:TO with as many frames as there are blocks");
         }
     }
 
@@ -264,7 +264,7 @@ private:
         }
         const auto value = base::parseNumber<double>(field);
         if (!value || !(*value >= min && *value <= max)) {
-            refuse(column, "numbers from " + base::numberText(min) + " to " + base::numberText(max));
+            refuse(column, "a number from " + base::numberText(min) + " to " + base::numberText(max));
         }
         return *value;
     }
@@ -277,7 +277,7 @@ private:
         }
         const auto value = base::parseNumber<std::uint64_t>(field);
         if (!value || *value > max) {
-            refuse(column, "the integers 0 to " + std::to_string(max));
+            refuse(column, "an integer from 0 to " + std::to_string(max));
         }
         return *value;
     }

@@ -75,7 +75,7 @@ ErrorCounts countsOf(const Json& json, const std::string& place)
     for (const Json& frame : members.list("failures")) {
         if (!frame.is_number_unsigned() || counts.failures.size() == ErrorCounts::keptFailures) {
             members.refuse("failures",
-                           "allowed are " + std::to_string(ErrorCounts::keptFailures) + " numbers of frames at most");
+                           "expected at most " + std::to_string(ErrorCounts::keptFailures) + " frame numbers");
         }
         counts.failures.push_back(frame.get<std::uint64_t>());
     }

@@ -163,7 +163,7 @@ ResultFormat formatOf(const std::string& fileName)
     if (endsIn(fileName, ".json")) {
         return ResultFormat::json;
     }
-    throw base::Error(fileName + ": is no name for results, allowed are names that end in .csv or .json");
+    throw base::Error(fileName + ": is not a name for results, expected one that ends in .csv or .json");
 }
 
 std::string csvText(const Results& results)

@@ -35,7 +35,7 @@ constexpr std::uint64_t mostPoints = 1000000;
 void appendNumPu(const std::string& text, std::vector<unsigned>& values)
 {
     if (text != "2" && text != "4" && text != "8") {
-        refuse("--num-pu", text, "allowed are 2, 4, 8");
+        refuse("--num-pu", text, "expected 2, 4 or 8");
     }
     values.push_back(static_cast<unsigned>(text[0] - '0'));
 }
@@ -44,7 +44,7 @@ void appendAlgorithm(const std::string& text, std::vector<unsigned>& values)
 {
     const auto algorithm = simulation::algorithmOf(text);
     if (!algorithm) {
-        refuse("--algorithm", text, "allowed are 0, 1, 2, max-log, scaled, table");
+        refuse("--algorithm", text, "expected 0, 1, 2, max-log, scaled or table");
     }
     values.push_back(*algorithm);
 }
@@ -57,7 +57,7 @@ void appendScale(const std::string& text, std::vector<simulation::ScaleOption>& 
     }
     const auto milliScale = parseThousandths(text);
     if (!milliScale || *milliScale <= 0 || *milliScale > largestMilliScale) {
-        refuse("--scale", text, "allowed are auto and the numbers above 0 up to 1000, with at most three decimals");
+        refuse("--scale", text, "expected auto or a number above 0 and up to 1000, with at most three decimals");
     }
     values.emplace_back(*milliScale);
 }
@@ -66,13 +66,13 @@ void appendIterations(const std::string& text, std::vector<unsigned>& values)
 {
     const auto iterations = base::parseNumber<std::uint32_t>(text);
     if (!iterations || *iterations < 1 || *iterations > 15) {
-        refuse("--iterations", text, "allowed are the integers 1 to 15");
+        refuse("--iterations", text, "expected an integer from 1 to 15");
     }
     values.push_back(*iterations);
 }
 
 /// What the axes take besides numbers, for messages.
-constexpr char orRange[] = ", and START:STEP:STOP";
+constexpr char orRange[] = ", or START:STEP:STOP";
 
 void appendDecibels(const std::string& option, const std::string& text, std::vector<int>& values)
 {
@@ -106,7 +106,7 @@ std::function<void(const std::string&)> countInto(const std::string& option, std
     return [option, &count](const std::string& text) {
         count = base::parseNumber<std::uint64_t>(text);
         if (!count || *count == 0) {
-            refuse(option, text, "allowed are the integers from 1 on");
+            refuse(option, text, "expected an integer from 1 on");
         }
     };
 }
@@ -125,7 +125,7 @@ double parseSeconds(const std::string& option, const std::string& text)
     }
     const auto value = base::parseNumber<double>(number);
     if (!value || !(*value > 0 && *value < 1e9)) {
-        refuse(option, text, "allowed are numbers above 0, of seconds, or with s, m or h after them");
+        refuse(option, text, "expected a number above 0, in seconds or with s, m or h after it");
     }
     return *value * unit;
 }
@@ -134,7 +134,7 @@ double parseStopBler(const std::string& text)
 {
     const auto value = base::parseNumber<double>(text);
     if (!value || !(*value >= 0 && *value <= 1)) {
-        refuse("--stop-bler", text, "allowed are the numbers from 0 to 1");
+        refuse("--stop-bler", text, "expected a number from 0 to 1");
     }
     return *value;
 }
@@ -249,7 +249,7 @@ void addRuleOptions(CLI::App& command, BerOptions& options)
             [&options](const std::string& text) {
                 const auto seed = base::parseNumber<std::uint64_t>(text);
                 if (!seed) {
-                    refuse("--seed", text, "allowed are the integers 0 to 18446744073709551615");
+                    refuse("--seed", text, "expected an integer from 0 to 18446744073709551615");
                 }
                 options.seed = *seed;
             },

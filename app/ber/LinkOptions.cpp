@@ -30,7 +30,7 @@ auto integersOf(const std::string& option, unsigned least, unsigned most)
     return [=](const std::string& text, std::vector<unsigned>& values) {
         const auto value = base::parseNumber<std::uint32_t>(text);
         if (!value || *value < least || *value > most) {
-            refuse(option, text, "allowed are the integers " + std::to_string(least) + " to " + std::to_string(most));
+            refuse(option, text, "expected an integer from " + std::to_string(least) + " to " + std::to_string(most));
         }
         values.push_back(*value);
     };
@@ -40,7 +40,7 @@ void appendCodeRate(const std::string& text, std::vector<int>& values)
 {
     const auto rate = base::parseThousandths(text);
     if (!rate || *rate <= 0 || *rate > 1000) {
-        refuse("--code-rate", text, "allowed are the numbers above 0 up to 1, with at most three decimals");
+        refuse("--code-rate", text, "expected a number above 0 and up to 1, with at most three decimals");
     }
     values.push_back(*rate);
 }
@@ -52,7 +52,7 @@ void appendMcs(const std::string& text, std::vector<unsigned>& values)
     const auto to = base::parseNumber<std::uint32_t>(ends.back());
     const unsigned last = countOf(link::McsTable::qam64) - 1;
     if (!from || !to || ends.size() > 2 || *from > *to || *to > last) {
-        refuse("--mcs", text, "allowed are 0 to " + std::to_string(last) + ", and FROM:TO");
+        refuse("--mcs", text, "expected 0 to " + std::to_string(last) + ", or FROM:TO");
     }
     for (unsigned index = *from; index <= *to; ++index) {
         values.push_back(index);
@@ -63,7 +63,7 @@ void appendModulation(const std::string& text, std::vector<link::Modulation>& va
 {
     const auto modulation = link::modulationOf(text);
     if (!modulation) {
-        refuse("--modulation", text, "allowed are bpsk, qpsk, 16qam, 64qam, 256qam");
+        refuse("--modulation", text, "expected bpsk, qpsk, 16qam, 64qam or 256qam");
     }
     values.push_back(*modulation);
 }
@@ -100,9 +100,9 @@ void addChoice(CLI::App& command,
     const auto take = [=, &value](const std::string& text) {
         const auto found = std::find(words.begin(), words.end(), text);
         if (found == words.end()) {
-            std::string allowed = "allowed are";
+            std::string allowed = "expected";
             for (const std::string& word : words) {
-                allowed += (word == words.front() ? " " : ", ") + word;
+                allowed += (word == words.front() ? " " : word == words.back() ? " or " : ", ") + word;
             }
             refuse(name, text, allowed);
         }
@@ -231,7 +231,7 @@ void checkTogether(const LinkOptions& options, bool hasBlockSize)
         const unsigned last = countOf(options.mcsTable.value_or(link::McsTable::qam64)) - 1;
         expect(options.mcsIndices.back() <= last,
                "--mcs " + std::to_string(options.mcsIndices.back()) + " is not in --mcs-table " +
-                   std::string(simulation::nameOf(*options.mcsTable)) + ", allowed are 0 to " + std::to_string(last));
+                   std::string(simulation::nameOf(*options.mcsTable)) + ", expected 0 to " + std::to_string(last));
     }
 }
 

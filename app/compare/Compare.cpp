@@ -70,7 +70,7 @@ int compare(const Options& options)
         comparison::compare(model, dump.values, options.ignoreUnknown ? Unknown::isIgnored : Unknown::differs);
     if (found.compared() == 0) {
         throw base::Error(input.name() +
-                          (found.unknown() > 0 ? ": holds no known value" : ": holds no value that the core computes"));
+                          (found.unknown() > 0 ? ": has no known value" : ": has no value that the core computes"));
     }
     const comparison::Coverage coverage = comparison::coverageOf(model, dump);
     // A few values may match another run by chance.
@@ -84,15 +84,17 @@ int compare(const Options& options)
 }
 
 constexpr char explanationBeforeSignals[] =
-    R"(A dump has the values of a simulation of hardware: CSV with the columns half_iteration, step,
-signal and value, or a VCD in whose scopes half_iteration and step say what the others belong
-to. Signals: )";
+    R"(A dump holds the values of a hardware simulation: CSV with the columns half_iteration, step,
+signal and value, or VCD whose scopes have variables half_iteration and step, which tell where
+the other values belong.
+Signals: )";
 
 constexpr char explanationAfterSignals[] =
     R"(.
-It may lack signals, but not values of those that it has, unless --partial is given; a value
-that is x differs, unless --ignore-x is given. MAP is a JSON object that tells other names
-and forms of numbers; docs/compare.md has examples.
+
+A dump may leave out whole signals. Other missing values are an error without --partial, and an
+x is a difference without --ignore-x. The map is a JSON object with other names and number
+formats; docs/compare.md has examples.
 
 Exit status: 0 all values agree, 1 a difference was found or values are missing, 2 bad input
 or usage.
@@ -104,25 +106,25 @@ Example:
 
 Command addCompare(CLI::App& app)
 {
-    CLI::App* command = app.add_subcommand("compare", "Find where a simulation of hardware leaves the model");
+    CLI::App* command = app.add_subcommand("compare", "Find where a hardware simulation departs from the model");
     const auto options = std::make_shared<Options>();
 
     command->add_option("--block", options->block, "Soft values, as 'morvik decode' takes them")
         ->type_name("FILE")
         ->required();
-    command->add_option("--block-number", options->number, "Which block of the file, from 0")
+    command->add_option("--block-number", options->number, "Number of the block in the file, from 0")
         ->transform(integerFrom(0, UINT32_MAX - 1))
         ->type_name("N")
         ->capture_default_str();
     command->add_option("--dump", options->dump, "Values of the simulation, as CSV or VCD")
         ->type_name("FILE")
         ->required();
-    command->add_option("--map", options->map, "Names and forms of numbers in the dump, as JSON")->type_name("FILE");
-    command->add_option("--format", options->form, "csv or vcd; otherwise as the name of the dump ends")
+    command->add_option("--map", options->map, "Names and number formats of the dump, as JSON")->type_name("FILE");
+    command->add_option("--format", options->form, "csv or vcd; by default from the file name extension")
         ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
         ->type_name("FORMAT");
-    command->add_flag("--ignore-x", options->ignoreUnknown, "Leave out unknown values, and count them");
-    command->add_flag("--partial", options->partial, "Accept a dump that lacks values of its signals, and count them");
+    command->add_flag("--ignore-x", options->ignoreUnknown, "Ignore unknown values (x), but count them");
+    command->add_flag("--partial", options->partial, "Accept missing values, but count them");
     addDecoderOptions(*command, options->decoder);
     command->footer(explanationBeforeSignals + signalNames() + explanationAfterSignals);
 

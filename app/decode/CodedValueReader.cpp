@@ -52,7 +52,7 @@ void CodedValueReader::readRow()
 {
     itsLabel = itsRow.fields().front();
     if (!isLabel(itsLabel)) {
-        itsLines.fail("block " + base::shown(itsLabel) + " is no label, allowed are non-negative integers");
+        itsLines.fail("block " + base::shown(itsLabel) + " is not a label, expected a non-negative integer");
     }
     const std::size_t found = itsRow.fields().size() - 1;
     if (found != itsCodedBits) {
@@ -65,7 +65,7 @@ void CodedValueReader::readRow()
         const auto value = base::parseNumber<float>(field);
         if (!value || !std::isfinite(*value)) {
             itsLines.fail("column " + std::to_string(i + 2) + ": " + base::shown(field) +
-                          " is not allowed, allowed are finite numbers");
+                          " is not allowed, expected a finite number");
         }
         itsValues[i] = *value;
     }

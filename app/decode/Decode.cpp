@@ -99,14 +99,13 @@ void decodeBlock(Decoder& decoder,
     try {
         decoder.decode(block, iterations, tag, bits);
         if (bits.empty()) {
-            refusal = "holds no bit but those of the tail";
+            refusal = "has no bits besides the tail";
         }
     } catch (const Refusal& error) {
         refusal = "was refused by the decoder (" + std::string(error.what()) + ")";
     }
     if (!refusal.empty()) {
-        place.failBlock("block of " + base::counted(block.size(), "row") + ' ' + refusal + ", allowed are " +
-                        allowedRows);
+        place.failBlock("block of " + base::counted(block.size(), "row") + ' ' + refusal + ", expected " + allowedRows);
     }
 }
 
@@ -182,7 +181,7 @@ float readScale(const std::string& text)
 {
     const auto scale = base::parseNumber<float>(text);
     if (!scale || !std::isfinite(*scale) || *scale <= 0) {
-        refuse("--scale", text, "allowed are numbers above 0");
+        refuse("--scale", text, "expected a number above 0");
     }
     return *scale;
 }
@@ -200,10 +199,10 @@ TransportDecodeOptions transportOptions(const Options& options)
 /// The end of the help text.
 std::string explanation()
 {
-    return std::string("FILE opens with the line ") + softValueHeader + R"(
+    return std::string("FILE starts with the line ") + softValueHeader + R"(
 and has one row for each of the K + 4 positions of a block. A new number in the first
-column starts a new block. Each block gives one line of 0 and 1. Soft values are clipped to
--128 ... 127, after the core has cut them to their low 24 bits.
+column starts a new block. Each block becomes a line of zeros and ones. The core keeps the low
+24 bits of a soft value, then clips it to -128 ... 127.
 
 With --transport-block-size, FILE opens with the line
 block,soft_values
@@ -271,7 +270,7 @@ Command addDecode(CLI::App& app)
     command->add_option("--reference", options->reference, "Compare with the bits in FILE, one line for each block")
         ->type_name("FILE");
     addDecoderOptions(*command, options->decoder);
-    command->add_option("--tag", options->firstTag, "Tag of the first block; the others count up from it")
+    command->add_option("--tag", options->firstTag, "Tag of the first block; later blocks count up from it")
         ->transform(integerFrom(0, UINT32_MAX))
         ->type_name("N")
         ->capture_default_str();

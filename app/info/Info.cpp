@@ -203,7 +203,7 @@ std::string information(const Options& options)
         return generalInformation(options);
     }
     if (rules::findBlockSize(*options.K) == nullptr) {
-        throw std::invalid_argument(std::to_string(*options.K) + " is no block size, " + blockSizesNear(*options.K));
+        throw std::invalid_argument(std::to_string(*options.K) + " is not a block size, " + blockSizesNear(*options.K));
     }
     const BlockLayout layout = layoutOf(*options.K);
     if (!options.plot.empty()) {
@@ -225,7 +225,7 @@ int inform(const Options& options)
 
 Command addInfo(CLI::App& app)
 {
-    CLI::App* command = app.add_subcommand("info", "Tell how the core works on a block size");
+    CLI::App* command = app.add_subcommand("info", "Show how the core handles a block size");
     const auto options = std::make_shared<Options>();
 
     command->add_option("K", options->K, "Block size in bits; without it, all block sizes")
@@ -235,11 +235,10 @@ Command addInfo(CLI::App& app)
     command->add_flag("--table", options->table, "Print the interleaver as CSV instead; with --json, add it");
     command->add_flag("--json", options->json, "Print a JSON object instead of text, with all windows in order");
     command
-        ->add_option("--plot",
-                     options->plot,
-                     "Draw segments and windows in the order in which they are computed, as .svg, .png or .pdf")
+        ->add_option(
+            "--plot", options->plot, "Draw segments and windows in the order of computation, as .svg, .png or .pdf")
         ->type_name("FILE");
-    command->footer(R"(Exit status: 0 done, 2 bad usage, or a file that cannot be written.
+    command->footer(R"(Exit status: 0 done, 2 bad usage or a file that cannot be written.
 
 Example:
   morvik info 1280 --plot windows.svg)");

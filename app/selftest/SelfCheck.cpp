@@ -58,7 +58,7 @@ void decodeAs(const State& state, const CheckBatch& batch, Decided& decided, Sim
                                          nullptr,
                                          &outputs);
     if (status != 0) {
-        throw std::runtime_error("the decoder has refused a block");
+        throw std::runtime_error("the decoder refused a block");
     }
 }
 

@@ -107,14 +107,14 @@ int test(const Options& options)
 
 Command addSelfTest(CLI::App& app)
 {
-    CLI::App* command = app.add_subcommand("selftest", "Prove that this machine gives the promised bits");
+    CLI::App* command = app.add_subcommand("selftest", "Check that this machine computes the promised bits");
     const auto options = std::make_shared<Options>();
     command->add_flag("--json", options->json, "Print a JSON object instead of text");
     command->footer(R"(Decodes blocks of all sizes in every configuration, with each instruction set that the machine
-has and with the components of the model, and compares digests of decisions and log-likelihood
-ratios with those that every machine has to give.
+has and with the components of the model, and compares digests of the decisions and log-likelihood
+ratios with the promised ones.
 
-Exit status: 0 all are right, 1 some differ, 2 bad usage.)");
+Exit status: 0 all match, 1 some differ, 2 bad usage.)");
 
     const auto run = [options] {
         return test(*options);

@@ -38,7 +38,7 @@ public:
     void read()
     {
         if (!itsMap.valid.empty()) {
-            itsFile.failAsAWhole("is CSV, of which all rows count; \"valid\" in a map is for VCD");
+            itsFile.failAsAWhole("is CSV, where every row counts; \"valid\" in a map is for VCD");
         }
         if (!itsRow.next()) {
             itsFile.fail("no header, expected the columns half_iteration, step, signal, value");
@@ -125,7 +125,7 @@ private:
         const std::string_view name = itsRow.fields()[*itsSignal];
         const auto signal = signalOf(name);
         if (!signal) {
-            itsFile.fail("signal " + shown(name) + " is not known; a map tells which it is, or that it does not count");
+            itsFile.fail("signal " + shown(name) + " is not known; use a map to name it, or to ignore it");
         }
         if (*signal != NameMap::leftOut) {
             take(name, *signal, itsRow.fields()[itsValue]);

@@ -44,9 +44,9 @@ unsigned DumpFile::count(const std::string& what, std::string_view text, unsigne
 {
     const auto value = base::parseNumber<unsigned>(text);
     if (!value || *value < first || *value - first >= count) {
-        fail(what + ' ' + base::shown(text) + " is not allowed, allowed are the integers " + std::to_string(first) +
+        fail(what + ' ' + base::shown(text) + " is not allowed, expected an integer from " + std::to_string(first) +
              " to " + std::to_string(first + count - 1) +
-             (first == 0 && value == count ? "; a map tells when they count from 1" : ""));
+             (first == 0 && value == count ? "; use a map if they count from 1" : ""));
     }
     return *value - first;
 }

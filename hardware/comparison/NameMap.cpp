@@ -88,8 +88,8 @@ private:
             }
         } else {
             fail(shown(key) +
-                 " is no key of a map, allowed are columns, signals, numbers, bits, first_half_iteration, first_step, "
-                 "valid");
+                 " is not a key of a map, expected columns, signals, numbers, bits, first_half_iteration, first_step "
+                 "or valid");
         }
     }
 
@@ -104,7 +104,7 @@ private:
     unsigned count(const std::string& key, const Json& value, unsigned first, unsigned last) const
     {
         if (!value.is_number_unsigned() || value.get<std::uint64_t>() < first || value.get<std::uint64_t>() > last) {
-            fail(shown(key) + " is " + shownValue(value) + ", allowed are the integers " + std::to_string(first) +
+            fail(shown(key) + " is " + shownValue(value) + ", expected an integer from " + std::to_string(first) +
                  " to " + std::to_string(last));
         }
         return value.get<unsigned>();
@@ -117,7 +117,7 @@ private:
                 return kind;
             }
         }
-        fail("\"numbers\" is " + shownValue(value) + ", allowed are auto, integer, unsigned, real, hex, binary");
+        fail("\"numbers\" is " + shownValue(value) + ", expected auto, integer, unsigned, real, hex or binary");
     }
 
     static std::optional<unsigned> signalOf(const Json& name)
@@ -139,7 +139,7 @@ private:
         for (const auto& [name, bits] : value.items()) {
             const auto signal = signalOf(name);
             if (!signal) {
-                fail("bits of " + shown(name) + ", allowed are " + signalNames());
+                fail("bits of " + shown(name) + ", expected " + signalNames());
             }
             map.bits[*signal] = count(name, bits, fewest, most);
         }
@@ -148,7 +148,7 @@ private:
     void readSignals(const Json& value, NameMap& map) const
     {
         if (!value.is_object()) {
-            fail("\"signals\" is no object");
+            fail("\"signals\" is not an object");
         }
         for (const auto& [theirs, ours] : value.items()) {
             if (ours.is_array()) {
@@ -157,7 +157,7 @@ private:
             }
             const auto signal = signalOf(ours);
             if (!signal && !ours.is_null()) {
-                fail("signal " + shown(theirs) + " is " + shownValue(ours) + ", allowed are " + signalNames() +
+                fail("signal " + shown(theirs) + " is " + shownValue(ours) + ", expected " + signalNames() +
                      ", and null");
             }
             map.signals[theirs] = signal.value_or(NameMap::leftOut);
@@ -172,7 +172,7 @@ private:
         const auto signal = ours.size() == 2 ? signalOf(ours[0]) : std::nullopt;
         if (!signal || twinOf(*signal) == *signal || signalOf(ours[1]) != twinOf(*signal)) {
             fail("signal " + shown(theirs) +
-                 " is a list, allowed are two signals that are always equal: g0 and g3, or "
+                 " is a list, expected two signals that are always equal: g0 and g3, or "
                  "g1 and g2");
         }
         map.signals[theirs] = *signal;
@@ -183,7 +183,7 @@ private:
     void readColumns(const Json& value, NameMap& map) const
     {
         if (!value.is_object()) {
-            fail("\"columns\" is no object");
+            fail("\"columns\" is not an object");
         }
         for (const auto& [key, theirs] : value.items()) {
             std::string* const column = key == "half_iteration" ? &map.passColumn
@@ -192,7 +192,7 @@ private:
                                         : key == "value"        ? &map.valueColumn
                                                                 : nullptr;
             if (column == nullptr) {
-                fail("column " + shown(key) + ", allowed are half_iteration, step, signal, value");
+                fail("column " + shown(key) + ", expected half_iteration, step, signal or value");
             }
             *column = text(key, theirs);
             map.namesRows = map.namesRows || key == "signal" || key == "value";
@@ -261,7 +261,7 @@ std::string NameMap::expectedNumber(unsigned signal) const
     case NumberForm::integer:
         return "an integer from -2048 to 2047";
     default:
-        return "an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to 255.875; a map tells "
+        return "an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to 255.875; use a map for "
                "other forms";
     }
 }
@@ -271,7 +271,7 @@ NameMap readNameMap(std::istream& input, const std::string& name)
     constexpr std::size_t largest = std::size_t{1} << 20;  // more than a map needs for every net of a core
     const Json object = base::parseJson(base::readText(input, name, largest), name);
     if (!object.is_object()) {
-        throw base::Error(name + ": no map, expected a JSON object");
+        throw base::Error(name + ": not a map, expected a JSON object");
     }
     return MapReader(object, name).read();
 }

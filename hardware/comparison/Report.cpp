@@ -47,7 +47,7 @@ StageWords wordsOf(Stage stage)
     switch (stage) {
     case Stage::intrinsic:
         return {"intrinsic values",
-                "the intrinsic value: half the extrinsic value, the systematic value added (rule 13)"};
+                "the intrinsic value: half the extrinsic value plus the systematic value (rule 13)"};
     case Stage::branch:
         return {"branch metrics", "the branch metrics: sums of intrinsic and parity values, clipped (rule 5)"};
     case Stage::forward:
@@ -104,7 +104,7 @@ private:
             itsCompared.name + format(": compared %u of %u half-iterations, ", all.passes, itsDump.values.passes());
         itsText +=
             std::to_string(all.compared()) + " of " + base::counted(itsCompared.coverage.computed, "value") + ": ";
-        itsText += all.first ? base::counted(all.different(), "difference") : "all as the model computes them";
+        itsText += all.first ? base::counted(all.different(), "difference") : "all equal to the model";
         if (all.unknown() > 0 && !all.ignoresUnknown) {
             itsText += all.knownDifferent() == 0 ? ", all of them" : ", " + std::to_string(all.unknown()) + " of them";
             itsText += " unknown values (x)";
@@ -127,9 +127,7 @@ private:
         if (coverage.isComplete() || itsCompared.isPartial) {
             return;
         }
-        itsText +=
-            "Not complete: a dump should have all values of its signals. --partial accepts one that is meant to "
-            "hold fewer";
+        itsText += "Incomplete: values of its signals are missing. Use --partial if that is intended";
         if (coverage.iterations) {
             itsText += format("; for a simulation of fewer iterations, give --iterations %u", *coverage.iterations);
         }
@@ -233,7 +231,7 @@ private:
                                       : input.different == 0 ? "agrees"
                                                              : "differs";
             const unsigned all = signalsOf(input.stage).count;
-            const std::string part = input.present > 0 && input.present < all ? ", as far as it is in the dump" : "";
+            const std::string part = input.present > 0 && input.present < all ? " where it is in the dump" : "";
             itsText += format("  input %-10s of half-iteration %u, step %u: %s%s\n",
                               nameOf(input.stage).c_str(),
                               input.pass,
@@ -250,13 +248,13 @@ private:
     {
         const std::string operation = startText(place);
         if (differ) {
-            itsText += "An input differs, too, so the value may follow from it.\n\n";
+            itsText += "An input differs as well, so the value may merely follow from it.\n\n";
         } else if (itsComparison.inputs.empty()) {
-            itsText += "It comes from nothing that is computed before. At fault: " + operation + ".\n\n";
+            itsText += "It does not depend on earlier values. At fault: " + operation + ".\n\n";
         } else if (known) {
             itsText += "All its inputs agree. At fault: " + operation + ".\n\n";
         } else {
-            itsText += "At fault: " + operation + ", or what stands before it and is not in the dump.\n\n";
+            itsText += "At fault: " + operation + ", or an operation before it that is not in the dump.\n\n";
         }
     }
 
@@ -307,16 +305,16 @@ private:
             itsText +=
                 count.first ? format("   half-iteration %u, step %u\n", count.first->pass, count.first->step) : "\n";
         }
-        itsText +=
-            itsComparison.inputsAreKnown
-                ? "Faults do not follow from the dump's own inputs of them; other differences are consequences.\n"
-                : "Faults cannot be told from consequences, as the dump lacks inputs: the first stage that differs is "
-                  "looked at.\n";
+        itsText += itsComparison.inputsAreKnown ? "Faults are values that do not follow from their inputs in the dump; "
+                                                  "other differences are consequences.\n"
+                                                : "Without their inputs in the dump, faults cannot be told from "
+                                                  "consequences: only the first stage that differs is examined.\n";
         const auto agreesAllTheSame = [](const SignalCount& count) {
             return count.faults > 0 && count.different == 0;
         };
         if (std::any_of(itsComparison.signals.begin(), itsComparison.signals.end(), agreesAllTheSame)) {
-            itsText += "Where faults are no differences, the core worked on right inputs: the dump has these wrong.\n";
+            itsText +=
+                "Where a fault is not a difference, the core had the right inputs, but the dump has wrong ones.\n";
         }
         itsText += '\n';
     }
@@ -375,7 +373,7 @@ private:
             itsText += finding.isByChance ? "; with so few, this may be chance.\n" : ".\n";
             return;
         }
-        itsText += "no pattern that is known";
+        itsText += "no known pattern";
         if (!finding.shared.empty()) {
             itsText += finding.faults == 1 ? "; it is " : finding.explained < 1 ? "; " + part + " are " : "; all are ";
             itsText += finding.shared;

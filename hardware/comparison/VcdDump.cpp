@@ -184,7 +184,7 @@ private:
     {
         const auto time = base::parseNumber<std::uint64_t>(itsWord.substr(1));
         if (!time || *time > std::numeric_limits<std::uint64_t>::max() / itsTimescale.factor) {
-            itsFile.fail(shown(itsWord) + " is no time");
+            itsFile.fail(shown(itsWord) + " is not a time");
         }
         itsTime = *time * itsTimescale.factor;
     }
@@ -199,7 +199,7 @@ private:
         variable.name = expectWord("the name of a variable");
         variable.name = plainName(variable.name + restOfCommand());
         if (itsIsDeclared) {
-            itsFile.fail("variable " + shown(variable.name) + " behind the first values");
+            itsFile.fail("variable " + shown(variable.name) + " after the first values");
         }
         variable.net = static_cast<unsigned>(itsNets.size());
         variable.net = itsNets.try_emplace(identifier, variable.net).first->second;
@@ -249,7 +249,7 @@ private:
             }
         }
         if (std::find(itsDump.given.begin(), itsDump.given.end(), true) == itsDump.given.end()) {
-            itsFile.fail("no variable of the dump is a signal that is known; a map tells which is which");
+            itsFile.fail("no variable of the dump is a known signal; use a map to name them");
         }
         itsOfNet.resize(itsNets.size());
         for (unsigned variable = 0; variable < itsDependents.size(); ++variable) {
@@ -282,7 +282,7 @@ private:
             expectWord("the identifier of a variable");
             return;  // a string
         } else {
-            itsFile.fail(shown(itsWord) + " is no change of a value");
+            itsFile.fail(shown(itsWord) + " is not a value change");
         }
         const auto found = itsNets.find(identifier);
         if (found == itsNets.end()) {
@@ -400,7 +400,7 @@ private:
     {
         itsFile.fail(itsScopes.pathOf(one) + " and " + itsScopes.pathOf(other) + " both have " +
                      passSignals[place.signal].name + " of half-iteration " + std::to_string(place.pass) + ", step " +
-                     std::to_string(place.step) + "; a map chooses one, or tells by \"valid\" when they count");
+                     std::to_string(place.step) + "; use a map to choose one, or \"valid\" to tell when they count");
     }
 
     DumpFile itsFile;

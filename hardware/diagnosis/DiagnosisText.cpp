@@ -99,7 +99,7 @@ std::string strangerText(const Diagnosis& diagnosis)
 {
     const char* const names[] = {"rsc1_sys", "rsc1_par", "rsc2_par"};
     const std::size_t stream = *diagnosis.stranger;
-    return std::string("A stream does not belong: the signs of ") + names[stream] + " are wrong in " +
+    return std::string("A stream does not belong to these blocks: the signs of ") + names[stream] + " are wrong in " +
            percent(diagnosis.appearance.streams[stream]) + ", those of the others in " +
            percent(diagnosis.appearance.others(stream)) + ".\nIs it " +
            (stream == 2 ? "of another interleaver" : "of another encoder") + ", or of another block?\n";
@@ -124,11 +124,11 @@ std::string verdictText(const Diagnosis& diagnosis)
     const bool isMistaken = diagnosis.best.mistakes.count() > 0;
     switch (diagnosis.verdict) {
     case Verdict::healthy:
-        return "Healthy: all blocks decode as they are.\n";
+        return "Healthy: all blocks decode unchanged.\n";
     case Verdict::mistaken:
-        return "All blocks decode once this is changed.\n";
+        return "All blocks decode once this is fixed.\n";
     case Verdict::careless:
-        return "All blocks decode as they are, but worse than they could.\n";
+        return "All blocks decode, but not as well as they could.\n";
     case Verdict::strange:
         return strangerText(diagnosis);
     case Verdict::noisy:
@@ -136,11 +136,11 @@ std::string verdictText(const Diagnosis& diagnosis)
                ".\n" + noiseText(diagnosis);
     case Verdict::unexplained:
         return "Not explained: " + failing(diagnosis) + (isMistaken ? " even then" : " for another reason") +
-               ", as noise of this strength hardly ever does it.\n" + noiseText(diagnosis);
+               ", which noise of this strength hardly ever causes.\n" + noiseText(diagnosis);
     case Verdict::unrelated:
         break;
     }
-    return "Unrelated: with every mistake undone, the signs are wrong as often as chance makes them. Do the bits "
+    return "Unrelated: whatever mistake is undone, the signs are wrong as often as by chance. Do the bits "
            "belong "
            "to these blocks?\n";
 }
@@ -205,12 +205,12 @@ std::string textOf(const Diagnosis& diagnosis)
         text += appearanceText(diagnosis);
     }
     if (!diagnosis.hasNegative) {
-        text += "No value is negative, as half of them should be: these are hard bits, or were taken for unsigned.\n";
+        text += "No value is negative, though half should be: these are hard bits, or were read as unsigned.\n";
     }
     if (diagnosis.hasMore) {
         text += "Looked at the first " +
                 (diagnosis.blocks == 1 ? "block" : std::to_string(diagnosis.blocks) + " blocks") +
-                " alone: the file has more, --blocks N takes them.\n";
+                " only: the file has more; use --blocks N.\n";
     }
     return text;
 }

@@ -77,15 +77,15 @@ Explanation explain(Rows rows, std::size_t smallerSize)
     case Rows::tailMissing:
         return {"tail_missing",
                 "the tail is missing: a block of K bits has K + 4 rows",
-                "Write the twelve tail values into four more rows; all zeros, if they are not known."};
+                "Write the twelve tail values into four more rows; zeros if they are not known."};
     case Rows::first:
-        return {"rows_behind", "rows follow after the block", "Write the first K + 4 rows alone."};
+        return {"rows_behind", "there are extra rows after the block", "Write only the first K + 4 rows."};
     case Rows::last:
-        return {"rows_before", "rows stand before the block", "Write the last K + 4 rows alone."};
+        return {"rows_before", "there are extra rows before the block", "Write only the last K + 4 rows."};
     case Rows::ends:
         return {"rows_between",
-                "rows stand between data and tail",
-                "Write the first K rows and the last four, without those between."};
+                "there are extra rows between data and tail",
+                "Write only the first K rows and the last four."};
     case Rows::smaller:
         break;
     }
@@ -103,20 +103,20 @@ Explanation explain(Order order)
         break;
     case Order::dataReversed:
         return {"data_reversed",
-                "the rows of the data are in reversed order, those of the tail are not",
-                "Write the row of the bit that was encoded first as the first one."};
+                "the data rows are reversed, the tail rows are not",
+                "Start with the row of the bit that was encoded first."};
     case Order::sentReversed:
         return {"reference_reversed",
-                "the reference has the bits in reversed order",
-                "Encode and compare in one order: turn each line of the reference around, if the encoder is right."};
+                "the bits of the reference are reversed",
+                "Encode and compare in one order: reverse each line of the reference if the encoder is right."};
     case Order::sentByteReversed:
         return {"reference_bytes_reversed",
-                "the reference has the bits of each byte in reversed order",
+                "the bits of each byte of the reference are reversed",
                 "Unpack bytes in the order in which the encoder takes their bits (3GPP: most significant bit first)."};
     case Order::sentInverted:
-        return {"reference_inverted", "the reference has 0 for 1 and 1 for 0", "Exchange 0 and 1 in the reference."};
+        return {"reference_inverted", "the reference has 0 for 1 and 1 for 0", "Invert the bits of the reference."};
     }
-    return {"rows_reversed", "the rows are in reversed order, tail first", "Write the last row first."};
+    return {"rows_reversed", "the rows are reversed, tail first", "Write the last row first."};
 }
 
 Explanation explainColumns(const std::array<std::uint8_t, 3>& contents)

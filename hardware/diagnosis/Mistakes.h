@@ -33,7 +33,7 @@ enum class Order : std::uint8_t {
     rowsReversed,      ///< the last row first
     dataReversed,      ///< the same, but for the four rows of the tail
     sentReversed,      ///< the reference has the last bit first
-    sentByteReversed,  ///< the reference has the bits of each byte in reversed order
+    sentByteReversed,  ///< the bits of each byte of the reference are reversed
     sentInverted,      ///< the reference has 0 for 1
 };
 constexpr std::array<Order, 6> allOrders{Order::right,

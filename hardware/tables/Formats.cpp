@@ -42,7 +42,7 @@ void checkFits(std::int64_t value, const Column& column, const std::string& plac
     const std::int64_t range = std::int64_t{1} << column.bits;
     const std::int64_t lowest = column.isSigned ? -range / 2 : 0;
     if (value < lowest || value >= lowest + range) {
-        throw base::Error(place + ": " + column.name + ' ' + std::to_string(value) + " is not allowed, allowed are " +
+        throw base::Error(place + ": " + column.name + ' ' + std::to_string(value) + " is not allowed, expected " +
                           std::to_string(lowest) + " to " + std::to_string(lowest + range - 1));
     }
 }

@@ -85,7 +85,7 @@ public:
         std::string_view rest = std::string_view(found).substr(key == std::string::npos ? headerSize : key);
         const auto rows = base::take(rest, shapeKey) ? base::takeInteger(rest) : std::nullopt;
         if (!rows || found != header(itsTable, static_cast<std::uint64_t>(*rows))) {
-            throw base::Error(itsName + ": is no array of NumPy as it was written");
+            throw base::Error(itsName + ": is not the NumPy array that was written");
         }
         itsRows = static_cast<std::uint64_t>(*rows);
     }

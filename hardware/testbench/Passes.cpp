@@ -39,7 +39,7 @@ Passes::Passes(const SoftBlock& block, const veltra_ip_morvik_v1_0_generics& gen
     std::vector<std::uint8_t> bits;
     itsDecoder.decode(block, 1, 0, bits);
     if (bits.empty()) {
-        throw Refusal("holds no bit but those of the tail");
+        throw Refusal("has no bits besides the tail");
     }
     itsCut =
         rules::Cut(itsComponent.itsBlockSize - rules::tailSteps, itsComponent.itsNumPU, itsComponent.itsThreadsPerPU);

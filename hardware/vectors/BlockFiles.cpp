@@ -222,7 +222,7 @@ void BlockReader::readRow(std::size_t table)
 {
     if (!nextRow(table)) {
         throw base::Error(itsReaders[table]->place() + ": the rows of " + itsLayout.tables[table].name +
-                          " end too early for the blocks");
+                          " end before the blocks do");
     }
 }
 

@@ -71,7 +71,7 @@ std::vector<unsigned> blockSizesFrom(const base::JsonMembers& json)
     for (const base::Json& size : json.list("block_sizes")) {
         if (!size.is_number_unsigned() || size.get<std::uint64_t>() > UINT32_MAX ||
             rules::findBlockSize(size.get<std::uint32_t>()) == nullptr) {
-            json.refuse("block_sizes", "allowed are lists of block sizes of 3GPP TS 36.212");
+            json.refuse("block_sizes", "expected a list of block sizes of 3GPP TS 36.212");
         }
         sizes.push_back(size.get<unsigned>());
     }
@@ -85,7 +85,7 @@ int milliDecibelsFrom(const base::JsonMembers& json)
     const bool isInRange = decibels >= -most && decibels <= most;
     const int thousandths = isInRange ? static_cast<int>(std::lround(1000 * decibels)) : 0;
     if (!isInRange || base::fromThousandths(thousandths) != decibels) {
-        json.refuse("ebn0_db", "allowed are -50 to 50 dB, with at most three decimals");
+        json.refuse("ebn0_db", "expected -50 to 50 dB, with at most three decimals");
     }
     return thousandths;
 }
@@ -97,14 +97,14 @@ Settings settingsOf(const base::JsonMembers& json)
     settings.generics.C_NUM_PU = static_cast<std::int32_t>(json.integer("num_pu", 2, 8));
     const auto algorithm = rules::findAlgorithm(json.text("algorithm"));
     if (!algorithm) {
-        json.refuse("algorithm", "allowed are max-log, scaled, table");
+        json.refuse("algorithm", "expected max-log, scaled or table");
     }
     settings.generics.C_ALGORITHM_TYPE = static_cast<std::int32_t>(*algorithm);
     settings.generics.C_TAG_WIDTH = static_cast<std::int32_t>(json.integer("tag_width", 0, 32));
     settings.iterations = static_cast<unsigned>(json.integer("iterations", 1, 15));
     settings.width = static_cast<unsigned>(json.integer("width", 8, 16));
     if (settings.width % 8 != 0) {
-        json.refuse("width", "allowed are 8 and 16");
+        json.refuse("width", "expected 8 or 16");
     }
     settings.blockSizes = blockSizesFrom(json);
     settings.blocks = word(json, "blocks");

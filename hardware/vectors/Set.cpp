@@ -117,7 +117,7 @@ void expectSizes(const std::string& folder, const Manifest& manifest)
         const unsigned size = manifest.settings.blockSizes[number / manifest.settings.blocks];
         if (block.K != size) {
             throw base::Error(manifestIn(folder) + ": names random block " + std::to_string(number) + " of " +
-                              std::to_string(block.K) + " bits, its parameters make it of " + std::to_string(size));
+                              std::to_string(block.K) + " bits, its parameters make it " + std::to_string(size));
         }
         ++number;
     }
@@ -155,7 +155,7 @@ void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
     }
     for (const std::string& name : others) {
         if (std::filesystem::exists(pathOf(folder, name))) {
-            throw base::Error(pathOf(folder, name) + ": is none of the files that " + manifestName +
+            throw base::Error(pathOf(folder, name) + ": is not a file that " + manifestName +
                               " names, and cannot be checked");
         }
     }
@@ -170,7 +170,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
     for (const ManifestFile& file : format.files) {
         const std::string path = pathOf(folder, file.name);
         if (sha256(path) != file.sha256) {
-            throw base::Error(path + ": is not the file that was written, its sha256 differs from the manifest");
+            throw base::Error(path + ": has changed since it was written: its sha256 differs from the manifest");
         }
     }
     Core core(manifest.settings);

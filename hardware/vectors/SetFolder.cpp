@@ -52,7 +52,7 @@ bool isFolder(const std::string& path)
 void expectOwnFolder(const std::string& path)
 {
     if (exists(path) && !isFolder(path)) {
-        throw base::Error(path + ": is no folder, and is left alone; remove it, or choose another folder");
+        throw base::Error(path + ": is not a folder; remove it or choose another folder");
     }
 }
 
@@ -113,7 +113,7 @@ void expectSetFiles(const std::string& folder, const std::set<std::string>& othe
     for (const std::string& name : namesIn(folder)) {
         const bool isKnown = known.count(name) != 0 || name.rfind(temporaryName, 0) == 0;
         if (others.count(name) == 0 && (!isKnown || isFolder(pathOf(folder, name)))) {
-            throw base::Error(pathOf(folder, name) + ": is no file of a set; " + folder +
+            throw base::Error(pathOf(folder, name) + ": is not a file of a set; " + folder +
                               " is for unfinished ones alone");
         }
     }
@@ -296,7 +296,8 @@ void SetFolder::expectMovable() const
             throw base::Error(made(name) + ": is missing, the unfinished set cannot be placed");
         }
         if (exists(made(name)) && isThere && std::find(own.begin(), own.end(), name) == own.end()) {
-            throw base::Error(placed(name) + ": is no file of the earlier set, and the new one has such a file");
+            throw base::Error(placed(name) +
+                              ": is not a file of the earlier set, but the new set has one of this name");
         }
     }
 }
@@ -316,7 +317,7 @@ void expectPlaced(const std::string& folder)
 {
     if (!exists(pathOf(folder, manifestName)) && exists(pathOf(folder, asideName) + '/' + manifestName)) {
         throw base::Error(folder +
-                          ": has a set that is not placed yet; if its command was killed, the next "
+                          ": has a set that is not in place yet; if its command was killed, the next "
                           "'morvik vectors --out' into this folder finishes it");
     }
 }

@@ -17,7 +17,7 @@ TransportFormat checked(const TransportFormat& format, const CodeBlocks& blocks)
     const unsigned perSymbol = format.bitsPerSymbol * format.layers;
     if (perSymbol == 0 || format.bitsPerSymbol > 8 || format.layers > 4) {
         throw std::invalid_argument("symbols of " + std::to_string(format.bitsPerSymbol) + " bits on " +
-                                    std::to_string(format.layers) + " layers, allowed are 1 to 8 bits on 1 to 4");
+                                    std::to_string(format.layers) + " layers, expected 1 to 8 bits on 1 to 4");
     }
     if (format.codedBits % perSymbol != 0) {
         const unsigned below = format.codedBits / perSymbol * perSymbol;

@@ -251,7 +251,7 @@ TEST_F(BerLink, RefusesOptionsThatContradictEachOther)
     expectError("--mcs 1 --resource-blocks 1 --modulation qpsk",
                 "--mcs sets what --coded-bits, --code-rate and --modulation do: they cannot be given with it");
     expectError("--mcs 28 --mcs-table 256qam --resource-blocks 1",
-                "--mcs 28 is not in --mcs-table 256qam, allowed are 0 to 27");
+                "--mcs 28 is not in --mcs-table 256qam, expected 0 to 27");
     expectError("--transport-block-size 40 --coded-bits 120 --each-iteration --redundancy-versions 0,1",
                 "--each-iteration counts one transmission, --redundancy-versions 0,1 are 2");
     expectError("--transport-block-size 40 --coded-bits 120 --each-iteration --early-stop crc",
@@ -262,21 +262,21 @@ TEST_F(BerLink, RefusesOptionsThatContradictEachOther)
 
 TEST_F(BerLink, RefusesValues)
 {
-    expectNotAllowed("--transport-block-size", "0", "allowed are the integers 1 to 16777216");
-    expectNotAllowed("--coded-bits", "8388609", "allowed are the integers 1 to 8388608");
-    expectNotAllowed("--code-rate", "1.1", "allowed are the numbers above 0 up to 1, with at most three decimals");
-    expectNotAllowed("--mcs", "29", "allowed are 0 to 28, and FROM:TO");
-    expectNotAllowed("--mcs", "5:4", "allowed are 0 to 28, and FROM:TO");
-    expectNotAllowed("--mcs-table", "16qam", "allowed are 64qam, 256qam");
-    expectNotAllowed("--resource-blocks", "111", "allowed are the integers 1 to 110");
-    expectNotAllowed("--resource-elements", "169", "allowed are the integers 1 to 168");
-    expectNotAllowed("--modulation", "8psk", "allowed are bpsk, qpsk, 16qam, 64qam, 256qam");
-    expectNotAllowed("--redundancy-versions", "4", "allowed are the integers 0 to 3");
-    expectNotAllowed("--soft-buffer-bits", "1", "allowed are the integers 2 to 16");
-    expectNotAllowed("--channel", "rice", "allowed are awgn, rayleigh, block-rayleigh");
-    expectNotAllowed("--demapper", "soft", "allowed are max-log, exact");
-    expectNotAllowed("--early-stop", "always", "allowed are none, crc");
-    expectNotAllowed("--esn0", "51", "allowed are -50 to 50 dB, with at most three decimals, and START:STEP:STOP");
+    expectNotAllowed("--transport-block-size", "0", "expected an integer from 1 to 16777216");
+    expectNotAllowed("--coded-bits", "8388609", "expected an integer from 1 to 8388608");
+    expectNotAllowed("--code-rate", "1.1", "expected a number above 0 and up to 1, with at most three decimals");
+    expectNotAllowed("--mcs", "29", "expected 0 to 28, or FROM:TO");
+    expectNotAllowed("--mcs", "5:4", "expected 0 to 28, or FROM:TO");
+    expectNotAllowed("--mcs-table", "16qam", "expected 64qam or 256qam");
+    expectNotAllowed("--resource-blocks", "111", "expected an integer from 1 to 110");
+    expectNotAllowed("--resource-elements", "169", "expected an integer from 1 to 168");
+    expectNotAllowed("--modulation", "8psk", "expected bpsk, qpsk, 16qam, 64qam or 256qam");
+    expectNotAllowed("--redundancy-versions", "4", "expected an integer from 0 to 3");
+    expectNotAllowed("--soft-buffer-bits", "1", "expected an integer from 2 to 16");
+    expectNotAllowed("--channel", "rice", "expected awgn, rayleigh or block-rayleigh");
+    expectNotAllowed("--demapper", "soft", "expected max-log or exact");
+    expectNotAllowed("--early-stop", "always", "expected none or crc");
+    expectNotAllowed("--esn0", "51", "expected -50 to 50 dB, with at most three decimals, or START:STEP:STOP");
     expectNotAllowed(
         "--redundancy-versions", "0,1,2,3,0,1,2,3,0,1,2,3,0,1,2,3,0", "there are 16 transmissions at most");
 }

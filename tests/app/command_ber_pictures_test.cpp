@@ -91,17 +91,17 @@ TEST_F(BerPictures, TakeResultsOfEitherFormatAsReferences)
 TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)
 {
     expectRefusedAtOnce("--plot curves.gif",
-                        "curves.gif: a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
+                        "curves.gif: a plot's format follows from its suffix, expected .svg, .png or .pdf");
     expectRefusedAtOnce("--plot nowhere/curves.svg",
                         "nowhere/curves.svg: cannot be written: No such file or directory");
     expectRefusedAtOnce("--report nowhere/report.html",
                         "nowhere/report.html: cannot be written: No such file or directory");
     expectRefusedAtOnce("--report results.csv",
-                        "results.csv: is no name for a report, allowed are names that end in .html");
+                        "results.csv: is not a name for a report, expected one that ends in .html");
     expectRefusedAtOnce("--reference nothing.csv", "nothing.csv: cannot be opened: No such file or directory");
     morvik.write("bad.csv", "ebn0_db,ber\n0,much\n");
     expectRefusedAtOnce("--reference bad.csv",
-                        "bad.csv:2: \"much\" in the column ber is not allowed, allowed are numbers from 0 to 1");
+                        "bad.csv:2: \"much\" in the column ber is not allowed, expected a number from 0 to 1");
 }
 
 TEST_F(BerPictures, ThatWouldTakeThePlaceOfTheResultsEndTheRunBeforeItBegins)
@@ -184,8 +184,8 @@ TEST_F(MergePictures, ThatCannotBeMadeAreRefusedBeforeAnythingIsWritten)
         EXPECT_EQ(morvik.names(), words("a.csv b.csv"));
     };
     expectNothingWritten("--plot all.gif",
-                         "all.gif: a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
-    expectNothingWritten("--report all.csv", "all.csv: is no name for a report, allowed are names that end in .html");
+                         "all.gif: a plot's format follows from its suffix, expected .svg, .png or .pdf");
+    expectNothingWritten("--report all.csv", "all.csv: is not a name for a report, expected one that ends in .html");
     expectNothingWritten("--reference none.csv", "none.csv: cannot be opened: No such file or directory");
     morvik.write("empty.csv", morvik.read("a.csv").substr(0, morvik.read("a.csv").find('\n') + 1));
     expectRefused(words("merge empty.csv --plot all.svg"), "morvik merge: there are no points to draw");

@@ -290,9 +290,9 @@ TEST_F(BerRuns, FindOutThatTheirOutputCannotBeWrittenBeforeTheyStart)
     expectRefused(run + Arguments{"none/a.csv"},
                   "morvik ber: none/a.csv: cannot be written: No such file or directory");
     expectRefused(run + Arguments{"a.txt"},
-                  "morvik ber: a.txt: is no name for results, allowed are names that end in .csv or .json");
+                  "morvik ber: a.txt: is not a name for results, expected one that ends in .csv or .json");
     expectRefused(run + Arguments{"-"},
-                  "morvik ber: -: is no name for results, allowed are names that end in .csv or .json");
+                  "morvik ber: -: is not a name for results, expected one that ends in .csv or .json");
     EXPECT_EQ(morvik.names(), Arguments{});
 }
 
@@ -340,7 +340,7 @@ TEST_F(BerRuns, ReplaceResultsOnlyWhenTheyAreAskedTo)
     EXPECT_EQ(csvRows(morvik.read("a.csv"))[0].at("seed"), "2");
     const CommandResult both = morvik.run(run + Arguments{"2", "--overwrite", "--resume"});
     EXPECT_EQ(both.status, 2);
-    EXPECT_EQ(both.err, "morvik ber: --resume excludes --overwrite; 'morvik ber --help' tells what is allowed\n");
+    EXPECT_EQ(both.err, "morvik ber: --resume excludes --overwrite; see 'morvik ber --help'\n");
 }
 
 // ---- Runs that are extended

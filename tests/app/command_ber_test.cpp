@@ -48,8 +48,7 @@ protected:
     void expectUsageError(const Arguments& arguments, const std::string& message) const
     {
         SCOPED_TRACE(message);
-        expectRefused(Arguments{"ber"} + arguments,
-                      "morvik ber: " + message + "; 'morvik ber --help' tells what is allowed");
+        expectRefused(Arguments{"ber"} + arguments, "morvik ber: " + message + "; see 'morvik ber --help'");
     }
 };
 
@@ -340,7 +339,7 @@ TEST_F(Ber, RefusesSizesAndNamesTheNearest)
     expectNotAllowed("--block-size", "500", nearest + "496 and 504");
     expectNotAllowed("--block-size", "40,520", "520", nearest + "512 and 528");
     expectNotAllowed("--block-size", "6143", nearest + "6080 and 6144");
-    const std::string all = "allowed are the block sizes of 3GPP TS 36.212, 40 to 6144";
+    const std::string all = "expected a block size of 3GPP TS 36.212, 40 to 6144";
     for (const char* size : {"39", "6145", "0", "-40", "forty", "40.0", "99999999999"}) {
         expectNotAllowed("--block-size", size, all);
     }
@@ -356,7 +355,7 @@ TEST_F(Ber, RefusesRanges)
     expectNotAllowed("--ebn0", "0:1", "a range is START:STEP:STOP");
     expectNotAllowed("--ebn0", "0:1:2:3", "a range is START:STEP:STOP");
     for (const char* text : {"x", "1.2345", "50.001", "-51", "nan", "1e1"}) {
-        expectNotAllowed("--ebn0", text, "allowed are -50 to 50 dB, with at most three decimals, and START:STEP:STOP");
+        expectNotAllowed("--ebn0", text, "expected -50 to 50 dB, with at most three decimals, or START:STEP:STOP");
     }
     for (const char* text : {"5", "5:5", "5:4", ":", "-1:5", "a:b"}) {
         expectNotAllowed("--frames", text, "allowed is FROM:TO, two integers, with FROM below TO");
@@ -365,29 +364,29 @@ TEST_F(Ber, RefusesRanges)
 
 TEST_F(Ber, RefusesValues)
 {
-    expectNotAllowed("--num-pu", "3", "allowed are 2, 4, 8");
-    expectNotAllowed("--num-pu", "2,", "", "allowed are 2, 4, 8");
-    expectNotAllowed("--algorithm", "3", "allowed are 0, 1, 2, max-log, scaled, table");
+    expectNotAllowed("--num-pu", "3", "expected 2, 4 or 8");
+    expectNotAllowed("--num-pu", "2,", "", "expected 2, 4 or 8");
+    expectNotAllowed("--algorithm", "3", "expected 0, 1, 2, max-log, scaled or table");
     for (const char* iterations : {"0", "16"}) {
-        expectNotAllowed("--iterations", iterations, "allowed are the integers 1 to 15");
+        expectNotAllowed("--iterations", iterations, "expected an integer from 1 to 15");
     }
     for (const char* scale : {"0", "1000.001", "automatic"}) {
         expectNotAllowed(
-            "--scale", scale, "allowed are auto and the numbers above 0 up to 1000, with at most three decimals");
+            "--scale", scale, "expected auto or a number above 0 and up to 1000, with at most three decimals");
     }
     for (const char* option : {"--block-errors", "--bit-errors", "--max-blocks"}) {
-        expectNotAllowed(option, "0", "allowed are the integers from 1 on");
-        expectNotAllowed(option, "1e6", "allowed are the integers from 1 on");
+        expectNotAllowed(option, "0", "expected an integer from 1 on");
+        expectNotAllowed(option, "1e6", "expected an integer from 1 on");
     }
     for (const char* option : {"--max-time", "--checkpoint-interval"}) {
         for (const char* time : {"0", "-1", "5d", "m", "inf"}) {
-            expectNotAllowed(option, time, "allowed are numbers above 0, of seconds, or with s, m or h after them");
+            expectNotAllowed(option, time, "expected a number above 0, in seconds or with s, m or h after it");
         }
     }
-    expectNotAllowed("--stop-bler", "2", "allowed are the numbers from 0 to 1");
-    expectNotAllowed("--stop-bler", "nan", "allowed are the numbers from 0 to 1");
-    expectNotAllowed("--seed", "18446744073709551616", "allowed are the integers 0 to 18446744073709551615");
-    expectNotAllowed("--threads", "0", "allowed are the integers 1 to 1024");
+    expectNotAllowed("--stop-bler", "2", "expected a number from 0 to 1");
+    expectNotAllowed("--stop-bler", "nan", "expected a number from 0 to 1");
+    expectNotAllowed("--seed", "18446744073709551616", "expected an integer from 0 to 18446744073709551615");
+    expectNotAllowed("--threads", "0", "expected an integer from 1 to 1024");
     expectNotAllowed("--replay", "5", "allowed is POINT:FRAME, two integers as in the results");
     expectNotAllowed("--replay", "1:2:3", "allowed is POINT:FRAME, two integers as in the results");
 }

@@ -59,7 +59,7 @@ INSTANTIATE_TEST_SUITE_P(
     testing::Values(
         FaultCase{"extrinsic_rounding", 512, 2, 1, 0, extrinsic, "one LSB too high: rounding"},
         FaultCase{"intrinsic_rounding", 512, 2, 1, 1, intrinsic, "one LSB too high: rounding"},
-        FaultCase{"ratio_rounding", 512, 2, 1, 0, ratio, "no pattern that is known; all are one LSB too high"},
+        FaultCase{"ratio_rounding", 512, 2, 1, 0, ratio, "no known pattern; all are one LSB too high"},
         FaultCase{
             "forward_bits_kept", 512, 2, 1, 2, segmentBorder, "the seven low bits of border metrics are not cleared"},
         FaultCase{
@@ -74,7 +74,7 @@ INSTANTIATE_TEST_SUITE_P(
                   1,
                   1,
                   "the metrics of the tail",
-                  "starts, on the natural code alone, in beta0 alone:\n  no pattern that is known.\n"},
+                  "starts, on the natural code alone, in beta0 alone:\n  no known pattern.\n"},
         FaultCase{"ratio_sign", 512, 2, 1, 0, ratio, "the sign is flipped"},
         FaultCase{"extrinsic_sign", 512, 2, 1, 0, extrinsic, "the sign is flipped"},
         FaultCase{"parity_sign", 512, 2, 1, 0, branch, "the sign of the parity is flipped"},
@@ -95,7 +95,7 @@ INSTANTIATE_TEST_SUITE_P(
         FaultCase{"extrinsic_stuck_bit", 512, 2, 1, 0, extrinsic, "bit 0 is stuck at 1"},
         FaultCase{"backward_uncorrected", 512, 2, 2, 0, backward, "the correction table is missing"},
         FaultCase{"forward_corrected_early", 512, 2, 2, 0, forward, "corrections come a decision early"},
-        FaultCase{"forward_state_swapped", 512, 2, 1, 0, forward, "no pattern that is known"},
+        FaultCase{"forward_state_swapped", 512, 2, 1, 0, forward, "no known pattern"},
         FaultCase{"border_six_bits", 512, 2, 1, 0, "the metrics of the tail", "six low bits of border metrics are"},
         FaultCase{"border_nine_bits", 512, 2, 1, 0, "the metrics of the tail", "nine low bits of border metrics are"},
         FaultCase{"border_bit_kept", 512, 2, 1, 2, segmentBorder, "ANDed with 0xFF90, not with 0xFF80 (rule 11)"},
@@ -234,7 +234,7 @@ TEST_F(Compare, TellsAMistakeInTheBlock)
     for (auto* const stream : {&block.sys, &block.par1, &block.par2}) {
         std::reverse(stream->begin(), stream->end());
     }
-    expectFound(block, "the rows are in reversed order, tail first");
+    expectFound(block, "the rows are reversed, tail first");
 }
 
 TEST_F(Compare, TakesFewValuesForNoOtherRun)

@@ -10,8 +10,7 @@ namespace {
 using namespace morvik::support;
 
 const std::string usualCore = "core: 2 units, scaled, 4 iterations\n";
-const std::string allOf1088 =
-    "compared 8 of 8 half-iterations, 200280 of 200280 values: all as the model computes them\n";
+const std::string allOf1088 = "compared 8 of 8 half-iterations, 200280 of 200280 values: all equal to the model\n";
 
 TEST_F(Compare, FindsNoDifferenceInTheCoreItself)
 {
@@ -63,7 +62,7 @@ TEST_F(Compare, TellsAWrongRecordFromAWrongValue)
     const CommandResult result = compare();
     EXPECT_EQ(result.status, 1);
     EXPECT_TRUE(has(result.out, "values: 1 difference\n")) << result.out;
-    EXPECT_TRUE(has(result.out, "Where faults are no differences, the core worked on right inputs")) << result.out;
+    EXPECT_TRUE(has(result.out, "Where a fault is not a difference, the core had the right inputs")) << result.out;
 }
 
 TEST_F(Compare, FindsAFaultInAWaveform)
@@ -120,7 +119,8 @@ TEST_F(Compare, TellsWhatADumpOfRatiosAloneTells)
     EXPECT_EQ(result.status, 1);
     EXPECT_TRUE(has(result.out, "  half-iteration  0, on the")) << result.out;
     EXPECT_TRUE(has(result.out, "input alpha      of half-iteration 0, step 0: not in the dump")) << result.out;
-    EXPECT_TRUE(has(result.out, "At fault: the log-likelihood ratio (rule 8), or what stands before it")) << result.out;
+    EXPECT_TRUE(has(result.out, "At fault: the log-likelihood ratio (rule 8), or an operation before it"))
+        << result.out;
     EXPECT_TRUE(has(result.out, "the sign is flipped")) << result.out;
 }
 
@@ -150,7 +150,7 @@ TEST_F(Compare, TakesUnknownValuesForDifferences)
     EXPECT_TRUE(has(ratios.out, "\nllr              320        0      320          320        0   half-iteration 0"))
         << ratios.out;
     EXPECT_TRUE(has(ratios.out, "Found in log-likelihood ratios, 320 differences:\n  unknown (x).\n")) << ratios.out;
-    expectRefused(compare({"--ignore-x"}), "rtl.csv: holds no known value");
+    expectRefused(compare({"--ignore-x"}), "rtl.csv: has no known value");
 }
 
 TEST_F(Compare, TellsUnknownValuesFromWrongOnes)
@@ -175,7 +175,7 @@ TEST_F(Compare, TellsUnknownValuesFromWrongOnes)
     EXPECT_EQ(ignored.status, 0);
     EXPECT_EQ(ignored.out,
               usualCore +
-                  "rtl.csv: compared 8 of 8 half-iterations, 7446 of 7448 values: all as the model computes them\n"
+                  "rtl.csv: compared 8 of 8 half-iterations, 7446 of 7448 values: all equal to the model\n"
                   "  ignored: 2 unknown values (x)\n");
 
     replace("7,3,beta2,", "999");
@@ -199,10 +199,9 @@ TEST_F(Compare, MissesWhatADumpLacks)
     }
     const std::string gaps =
         usualCore +
-        "rtl.csv: compared 8 of 8 half-iterations, 7439 of 7448 values: all as the model computes them\n"
+        "rtl.csv: compared 8 of 8 half-iterations, 7439 of 7448 values: all equal to the model\n"
         "  not in the dump: 9 values of beta2, llr; the first is beta2 of half-iteration 0, step 9\n";
-    const std::string demand =
-        "Not complete: a dump should have all values of its signals. --partial accepts one that is meant to hold fewer";
+    const std::string demand = "Incomplete: values of its signals are missing. Use --partial if that is intended";
     morvik.write("rtl.csv", gap);
     EXPECT_EQ(compare().status, 1);
     EXPECT_EQ(compare().out, gaps + demand + ".\n");
@@ -212,7 +211,7 @@ TEST_F(Compare, MissesWhatADumpLacks)
     morvik.write("rtl.csv", start);
     const CommandResult cut = compare();
     EXPECT_EQ(cut.status, 1);
-    EXPECT_TRUE(has(cut.out, "compared 1 of 8 half-iterations, 49 of 7448 values: all as")) << cut.out;
+    EXPECT_TRUE(has(cut.out, "compared 1 of 8 half-iterations, 49 of 7448 values: all equal")) << cut.out;
     EXPECT_TRUE(has(cut.out, "\n  not in the dump: half-iterations 1 to 7\n")) << cut.out;
 }
 
@@ -225,10 +224,10 @@ TEST_F(Compare, NeedsNoSignalAsAWhole)
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.out,
               usualCore +
-                  "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: all as the model computes them\n"
+                  "rtl.csv: compared 8 of 8 half-iterations, 320 of 7448 values: all equal to the model\n"
                   "  not in the dump: signals intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, extrinsic\n");
     morvik.write("rtl.csv", "half_iteration,step,llr,g0\n0,0,,\n");
-    expectRefused(compare(), "rtl.csv: holds no value that the core computes");
+    expectRefused(compare(), "rtl.csv: has no value that the core computes");
 }
 
 TEST_F(Compare, NeedsTwoBranchMetricsToTellFaults)
@@ -286,13 +285,13 @@ TEST_F(Compare, NamesBadFiles)
     morvik.write("rtl.csv", withLine(good, 9, "0,0,alpha3,2048"));
     expectRefused(compare(),
                   "rtl.csv:9: alpha3 \"2048\" is not allowed, expected an integer from -2048 to 2047, or a multiple of "
-                  "1/8 with a point from -256.0 to 255.875; a map tells other forms");
+                  "1/8 with a point from -256.0 to 255.875; use a map for other forms");
     morvik.write("rtl.csv", "half_iteration,step,signal,value\n");
-    expectRefused(compare(), "rtl.csv: holds no value that the core computes");
+    expectRefused(compare(), "rtl.csv: has no value that the core computes");
     morvik.write("block.csv", header + '\n' + zeroRows("0", 45));
-    expectRefused(compare(),
-                  "block.csv:2: block of 45 rows, allowed are K + 4 rows, K being one of the block sizes of 3GPP TS "
-                  "36.212 (40 to 6144)");
+    expectRefused(
+        compare(),
+        "block.csv:2: block of 45 rows, expected K + 4 rows, where K is a block size of 3GPP TS 36.212 (40 to 6144)");
 }
 
 }  // namespace

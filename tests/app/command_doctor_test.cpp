@@ -46,7 +46,7 @@ TEST_F(Doctor, FindsNothingWrongWithTheVectors)
         const CommandResult result = morvik.run(
             {"doctor", vectors(std::string(name) + ".csv"), "--reference", vectors(std::string(name) + ".bits")});
         EXPECT_EQ(result.status, 0) << result.out;
-        EXPECT_TRUE(has(result.out, "Healthy: all blocks decode as they are.")) << result.out;
+        EXPECT_TRUE(has(result.out, "Healthy: all blocks decode unchanged.")) << result.out;
         EXPECT_EQ(result.err, "");
     }
 }
@@ -60,7 +60,7 @@ TEST_F(Doctor, TellsAMistakeAndWhatToChange)
     EXPECT_TRUE(
         has(result.out,
             "Found: the sign of all soft values is flipped.\n  Negate all three columns: a positive value favours "
-            "bit 1.\nAll blocks decode once this is changed.\n"))
+            "bit 1.\nAll blocks decode once this is fixed.\n"))
         << result.out;
     EXPECT_EQ(result.err, "");
 }
@@ -102,8 +102,7 @@ TEST_F(Doctor, TellsThatTheBitsAreNotThoseOfTheBlock)
 TEST_F(Doctor, TellsThatNoValueIsNegative)
 {
     const std::string hint =
-        "No value is negative, as half of them should be: these are hard bits, or were taken for "
-        "unsigned.\n";
+        "No value is negative, though half should be: these are hard bits, or were read as unsigned.\n";
     std::vector<SentFrame> frames = sentFrames(512, 2, 6, 1);
     EXPECT_FALSE(has(examine(frames).out, hint));
     for (SentFrame& frame : frames) {
@@ -153,10 +152,10 @@ TEST_F(Doctor, LooksAtAsManyBlocksAsAskedFor)
 TEST_F(Doctor, TellsOfBlocksThatItHasNotLookedAt)
 {
     const std::vector<SentFrame> frames = sentFrames(40, 17, 6, 1);
-    const std::string line = "Looked at the first 16 blocks alone: the file has more, --blocks N takes them.\n";
+    const std::string line = "Looked at the first 16 blocks only: the file has more; use --blocks N.\n";
     EXPECT_TRUE(has(examine(frames).out, line));
     EXPECT_FALSE(has(examine(frames, {"--blocks", "17"}).out, "Looked at"));
-    EXPECT_TRUE(has(examine(frames, {"--blocks", "1"}).out, "Looked at the first block alone: "));
+    EXPECT_TRUE(has(examine(frames, {"--blocks", "1"}).out, "Looked at the first block only: "));
     EXPECT_EQ(nlohmann::json::parse(examine(frames, {"--json"}).out).at("more_blocks"), true);
 }
 
@@ -208,10 +207,10 @@ TEST_F(Doctor, RefusesBadInputInOneLineWithThePlace)
     const std::string bits = bitText(sentFrames(40, 2, 6, 1));
     expectRefusal(examine(soft, bits.substr(0, 41)), "in.bits:2: no line for block 2, expected one for each block");
     expectRefusal(examine(soft, std::string(39, '0') + '\n'),
-                  "in.bits:1: 39 bits, allowed are the block sizes of 3GPP TS 36.212 (40 to 6144)");
+                  "in.bits:1: 39 bits, expected a block size of 3GPP TS 36.212 (40 to 6144)");
     expectRefusal(examine(soft, std::string(48, '0') + '\n'), "in.csv:2: block of 44 rows for 48 bits, expected 52");
     expectRefusal(examine(soft, std::string(39, '0') + "x\n"),
-                  "in.bits:1: character \"x\" in column 40, allowed are 0 and 1");
+                  "in.bits:1: character \"x\" in column 40, expected 0 or 1");
     expectRefusal(examine("block,a\n", bits),
                   "in.csv:1: wrong header \"block,a\", expected \"block,rsc1_sys,rsc1_par,rsc2_par\"");
     const CommandResult none = morvik.run({"doctor", "none.csv", "--reference", "in.bits"});
@@ -222,7 +221,7 @@ TEST_F(Doctor, RefusesBadUsage)
 {
     const CommandResult result = morvik.run({"doctor", "in.csv"});
     EXPECT_EQ(result.status, 2);
-    EXPECT_EQ(result.err, "morvik doctor: --reference is required; 'morvik doctor --help' tells what is allowed\n");
+    EXPECT_EQ(result.err, "morvik doctor: --reference is required; see 'morvik doctor --help'\n");
     EXPECT_EQ(examine(sentFrames(40, 1, 6, 1), {"--blocks", "0"}).status, 2);
 }
 

@@ -152,7 +152,7 @@ TEST_F(EncodeTest, AgreesWithAnotherEncoderOfTransportBlocks)
 TEST_F(EncodeTest, RefusesWhatCannotBeEncoded)
 {
     morvik.write("bits", std::string(41, '1') + '\n');
-    expectRefused({"encode", "bits"}, "morvik encode: bits:1: 41 bits, allowed are the block sizes of 3GPP TS 36.212");
+    expectRefused({"encode", "bits"}, "morvik encode: bits:1: 41 bits, expected a block size of 3GPP TS 36.212");
     expectRefused({"encode", "bits", "--transport-block"}, "morvik encode: --transport-block requires --coded-bits");
     expectRefused({"encode", "bits", "--coded-bits", "100"}, "morvik encode: --coded-bits requires --transport-block");
     expectRefused({"encode", "bits", "--transport-block", "--coded-bits", "102", "--modulation", "16qam"},
@@ -162,11 +162,11 @@ TEST_F(EncodeTest, RefusesWhatCannotBeEncoded)
                   "morvik encode: bits:1: transport block of 41 bits, --coded-bits 100, --modulation qpsk: a circular "
                   "buffer of 1 has no bit of a block of 72\n");
     expectRefused({"encode", "bits", "--transport-block", "--coded-bits", "100", "--redundancy-version", "0,4"},
-                  "morvik encode: --redundancy-version: \"0,4\" is not allowed, allowed are 0 to 3");
+                  "morvik encode: --redundancy-version: \"0,4\" is not allowed, expected 0 to 3");
     expectRefused({"encode", "bits", "--output", "bits"}, "morvik encode: bits: ");
     morvik.write("other", "01a\n");
     expectRefused({"encode", "other", "--transport-block", "--coded-bits", "100"},
-                  "morvik encode: other:1: character \"a\" in column 3, allowed are 0 and 1\n");
+                  "morvik encode: other:1: character \"a\" in column 3, expected 0 or 1\n");
     morvik.write("empty", "");
     expectRefused({"encode", "empty", "--transport-block", "--coded-bits", "100"},
                   "morvik encode: empty:1: no blocks, expected a line of 0 and 1 for each\n");
@@ -243,9 +243,9 @@ TEST_F(TransportBlocksTest, OfWrongFormAreRefused)
     expectText(top + "0,1,2\n", "in.csv:2: 2 values, expected the 1600 of --coded-bits\n");
     for (const char* const value : {"nan", "inf", "-inf", "1e99", "", "1x"}) {
         expectText(top + "0,1," + value + zeros.substr(4),
-                   "in.csv:2: column 3: \"" + std::string(value) + "\" is not allowed, allowed are finite numbers\n");
+                   "in.csv:2: column 3: \"" + std::string(value) + "\" is not allowed, expected a finite number\n");
     }
-    expectText(top + "\n0" + zeros, "in.csv:2: blank line, allowed at the end only\n");
+    expectText(top + "\n0" + zeros, "in.csv:2: blank line before the end\n");
     morvik.write("in.csv", top + "0" + zeros + "0" + zeros);
     EXPECT_EQ(morvik.run(decode).err,
               start + "in.csv:3: block 0 has more rows than --redundancy-version has numbers, 1\n");

@@ -41,8 +41,8 @@ protected:
     }
 };
 
-const std::string allowedRows = "allowed are K + 4 rows, K being one of the block sizes of 3GPP TS 36.212 (40 to 6144)";
-const std::string allowedValues = " is not allowed, allowed are the integers -2147483648 to 2147483647";
+const std::string allowedRows = "expected K + 4 rows, where K is a block size of 3GPP TS 36.212 (40 to 6144)";
+const std::string allowedValues = " is not allowed, expected an integer from -2147483648 to 2147483647";
 
 // ---- What a file may look like
 
@@ -183,7 +183,7 @@ TEST_F(CommandFiles, RefusesValuesOutOfThirtyTwoBits)
 
 TEST_F(CommandFiles, RefusesLabelsThatAreNoNonNegativeIntegers)
 {
-    const std::string expected = " is no label, allowed are non-negative integers";
+    const std::string expected = " is not a label, expected a non-negative integer";
     expectRefused(withLine(twoBlocks(), 2, "-1,1,1,1"), "in.csv:2: block \"-1\"" + expected);
     expectRefused(withLine(twoBlocks(), 9, "first,1,1,1"), "in.csv:9: block \"first\"" + expected);
     expectRefused(withLine(twoBlocks(), 9, ",1,1,1"), "in.csv:9: block \"\"" + expected);
@@ -192,7 +192,7 @@ TEST_F(CommandFiles, RefusesLabelsThatAreNoNonNegativeIntegers)
 
 TEST_F(CommandFiles, RefusesABlankLineBetweenRows)
 {
-    expectRefused(withLine(twoBlocks(), 20, ""), "in.csv:20: blank line, allowed at the end only");
+    expectRefused(withLine(twoBlocks(), 20, ""), "in.csv:20: blank line before the end");
 }
 
 TEST_F(CommandFiles, KeepsTheBlocksBeforeAMistake)
@@ -259,7 +259,7 @@ TEST_F(CommandFiles, TellsTheDecodersReasonAndTheFirstLineOfARefusedBlock)
 TEST_F(CommandFiles, RefusesABlockOfTailBitsOnly)
 {
     expectRefused(header + '\n' + zeroRows("0", 4),
-                  "in.csv:2: block of 4 rows holds no bit but those of the tail, " + allowedRows);
+                  "in.csv:2: block of 4 rows has no bits besides the tail, " + allowedRows);
 }
 
 TEST_F(CommandFiles, RefusesABlockAsSoonAsItIsTooLarge)
@@ -273,20 +273,20 @@ TEST_F(CommandFiles, RefusesALineWithoutAnEnd)
 {
     const CommandResult result = morvik.run({"decode", "/dev/zero"});
     EXPECT_EQ(result.status, 2);
-    EXPECT_EQ(result.err, "morvik decode: /dev/zero:1: line is too long, allowed are 8192 characters\n");
+    EXPECT_EQ(result.err, "morvik decode: /dev/zero:1: line is longer than 8192 characters\n");
 }
 
 TEST_F(CommandFiles, RefusesBlankLinesWithoutAnEnd)
 {
     const std::string blank(10002, '\n');
-    const std::string endless = "blank lines without an end, allowed are 10000";
+    const std::string endless = "more than 10000 blank lines";
     expectRefused(twoBlocks() + blank, "in.csv:90: " + endless, zeroDecision + zeroDecision);
     expectReferenceRefused(zeroDecision + zeroDecision + blank, "ref.bits:2: " + endless);
 }
 
 TEST_F(CommandFiles, TellsHowToReadACompressedFile)
 {
-    const std::string reason = "is compressed by gzip; 'gunzip FILE' unpacks it";
+    const std::string reason = "is compressed with gzip; unpack it by 'gunzip FILE'";
     const std::string compressed = "\x1f\x8b\x08" + std::string(9000, 'x');
     expectRefused(compressed, "in.csv: " + reason);
     expectReferenceRefused(compressed, "ref.bits: " + reason);
@@ -300,8 +300,7 @@ TEST_F(CommandFiles, AllowsLinesUpToTheLongestLength)
     const CommandResult result = decode(header + '\n' + zeroRows(longLabel, 44));
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_EQ(result.out, zeroDecision);
-    expectRefused(header + '\n' + zeroRows(longLabel + '1', 44),
-                  "in.csv:2: line is too long, allowed are 8192 characters");
+    expectRefused(header + '\n' + zeroRows(longLabel + '1', 44), "in.csv:2: line is longer than 8192 characters");
 }
 
 // ---- Output that cannot be written
@@ -565,9 +564,9 @@ TEST_F(CommandFiles, RefusesAReferenceWithAnotherNumberOfLines)
 TEST_F(CommandFiles, RefusesAReferenceWithOtherCharacters)
 {
     expectReferenceRefused(zeroDecision + std::string(20, '0') + 'x' + std::string(19, '0') + '\n',
-                           "ref.bits:2: character \"x\" in column 21, allowed are 0 and 1");
+                           "ref.bits:2: character \"x\" in column 21, expected 0 or 1");
     expectReferenceRefused(zeroDecision + std::string(40, ' ') + '\n',
-                           "ref.bits:2: character \" \" in column 1, allowed are 0 and 1");
+                           "ref.bits:2: character \" \" in column 1, expected 0 or 1");
 }
 
 TEST_F(CommandFiles, RefusesAReferenceThatCannotBeRead)
@@ -576,8 +575,7 @@ TEST_F(CommandFiles, RefusesAReferenceThatCannotBeRead)
     EXPECT_EQ(missing.status, 2);
     EXPECT_EQ(missing.err, "morvik decode: missing.bits: cannot be opened: No such file or directory\n");
     EXPECT_EQ(missing.out, "");
-    expectReferenceRefused(zeroDecision + std::string(8193, '0'),
-                           "ref.bits:2: line is too long, allowed are 8192 characters");
+    expectReferenceRefused(zeroDecision + std::string(8193, '0'), "ref.bits:2: line is longer than 8192 characters");
 }
 
 }  // namespace

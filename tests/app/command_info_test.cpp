@@ -115,13 +115,13 @@ TEST_F(Info, DrawsAllFormats)
 
 TEST_F(Info, RefusesWhatItCannotTell)
 {
-    expectRefusal({"info", "41"}, "41 is no block size, the nearest block sizes of 3GPP TS 36.212 are 40 and 48");
-    expectRefusal({"info", "0"}, "0 is no block size, allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
-    expectRefusal({"info", "6145"}, "6145 is no block size, allowed are the block sizes of 3GPP TS 36.212, 40 to 6144");
+    expectRefusal({"info", "41"}, "41 is not a block size, the nearest block sizes of 3GPP TS 36.212 are 40 and 48");
+    expectRefusal({"info", "0"}, "0 is not a block size, expected a block size of 3GPP TS 36.212, 40 to 6144");
+    expectRefusal({"info", "6145"}, "6145 is not a block size, expected a block size of 3GPP TS 36.212, 40 to 6144");
     expectRefusal({"info", "--table"}, "--table needs a block size K");
     expectRefusal({"info", "--plot", "a.svg"}, "--plot needs a block size K");
     expectRefusal({"info", "40", "--plot", "a.jpg"},
-                  "a.jpg: a plot's format is known by its suffix, allowed are .svg, .png and .pdf");
+                  "a.jpg: a plot's format follows from its suffix, expected .svg, .png or .pdf");
     EXPECT_EQ(morvik.run({"info", "forty"}).status, 2);
     EXPECT_EQ(morvik.run({"info", "-40"}).status, 2);
 }

@@ -294,7 +294,7 @@ TEST_F(MpiRuns, TellOnceWhatIsWrong)
     const Arguments three = ranks(3);
     expectRefusedOnce(three + words("ber --block-size 500"),
                       "morvik-mpi ber: --block-size: \"500\" is not allowed, the nearest block sizes of 3GPP TS 36.212 "
-                      "are 496 and 504; 'morvik-mpi ber --help' tells what is allowed");
+                      "are 496 and 504; see 'morvik-mpi ber --help'");
     expectRefusedOnce(
         three + words("ber --block-size 40 --each-iteration --iterations 4,8"),
         "morvik-mpi ber: --each-iteration counts up to one number of --iterations, give only the largest");
@@ -304,8 +304,7 @@ TEST_F(MpiRuns, TellOnceWhatIsWrong)
     expectRefusedOnce(three + words("ber --block-size 40 --instruction-set mmx"),
                       "morvik-mpi" + alone.err.substr(6, alone.err.size() - 7));
     expectRefusedOnce(three + words("decode a.csv"),
-                      "morvik-mpi: The following arguments were not expected: a.csv decode; 'morvik-mpi --help' tells "
-                      "what is allowed");
+                      "morvik-mpi: The following arguments were not expected: a.csv decode; see 'morvik-mpi --help'");
 }
 
 TEST_F(MpiRuns, RefuseRanksThatDoSomethingElse)

@@ -275,22 +275,22 @@ TEST_F(Command, TagsCountUpWithinTheirWidth)
 TEST_F(Command, RefusesOptionValuesThatAreNotAllowed)
 {
     const std::string start = "morvik decode: ";
-    expectUsageError({"decode", "--num-pu", "3"}, start + "--num-pu: \"3\" is not allowed, allowed are 2, 4, 8");
+    expectUsageError({"decode", "--num-pu", "3"}, start + "--num-pu: \"3\" is not allowed, expected 2, 4 or 8");
     expectUsageError({"decode", "--algorithm", "best"},
-                     start + "--algorithm: \"best\" is not allowed, allowed are 0, 1, 2, max-log, scaled, table");
+                     start + "--algorithm: \"best\" is not allowed, expected 0, 1, 2, max-log, scaled or table");
     expectUsageError({"decode", "--algorithm", "3"}, start + "--algorithm: \"3\" is not allowed");
     expectUsageError({"decode", "--iterations", "0"},
-                     start + "--iterations: \"0\" is not allowed, allowed are the integers 1 to 15");
+                     start + "--iterations: \"0\" is not allowed, expected an integer from 1 to 15");
     expectUsageError({"decode", "--iterations", "16"}, start + "--iterations: \"16\" is not allowed");
     expectUsageError({"decode", "--iterations", "8x"}, start + "--iterations: \"8x\" is not allowed");
     expectUsageError({"decode", "--tag-width", "33"},
-                     start + "--tag-width: \"33\" is not allowed, allowed are the integers 0 to 32");
+                     start + "--tag-width: \"33\" is not allowed, expected an integer from 0 to 32");
     expectUsageError({"decode", "--tag-width", "-1"}, start + "--tag-width: \"-1\" is not allowed");
     expectUsageError({"decode", "--tag", "4294967296"},
-                     start + "--tag: \"4294967296\" is not allowed, allowed are the integers 0 to 4294967295");
+                     start + "--tag: \"4294967296\" is not allowed, expected an integer from 0 to 4294967295");
     expectUsageError({"decode", "--tag", "-1"}, start + "--tag: \"-1\" is not allowed");
     expectUsageError({"decode", "--trace", "all"},
-                     start + "--trace: \"all\" is not allowed, allowed are the integers 0 to 4294967295");
+                     start + "--trace: \"all\" is not allowed, expected an integer from 0 to 4294967295");
 }
 
 TEST_F(Command, RefusesArgumentsThatItDoesNotKnow)

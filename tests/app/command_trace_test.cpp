@@ -264,12 +264,12 @@ TEST_F(Trace, NeedsNoMoreMemoryForMorePasses)
 
 TEST_F(Trace, RefusesWhatIsNotAllowed)
 {
-    const std::string help = "; 'morvik trace --help' tells what is allowed";
+    const std::string help = "; see 'morvik trace --help'";
     const std::string k40 = vectors("k40.csv");
     const auto expectNoRange = [&](const std::string& wrong) {
         expectRefused({k40, "--iterations", "2", "--half-iterations=" + wrong},
                       "--half-iterations: \"" + wrong +
-                          "\" is not allowed, allowed are N and A:B, A not above B, from 0 to 3 (two for each of "
+                          "\" is not allowed, expected N or A:B, A not above B, from 0 to 3 (two for each of "
                           "--iterations)");
     };
     for (const char* const wrong : {"4", "0:4", "2:1", "a", "1:", ":1", "0:1:2", "-1"}) {
@@ -279,8 +279,8 @@ TEST_F(Trace, RefusesWhatIsNotAllowed)
         expectRefused(
             {k40, "--format", "csv", "--signals=" + wrong},
             "--signals: \"" + wrong +
-                "\" is not allowed, known are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic, "
-                "and g, alpha, beta for all of a kind" +
+                "\" is not allowed, expected intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, extrinsic, "
+                "or g, alpha, beta for all of a kind" +
                 help);
     };
     for (const char* const wrong : {"gamma", "alpha8", "g4", "ll"}) {
@@ -289,16 +289,17 @@ TEST_F(Trace, RefusesWhatIsNotAllowed)
     expectRefused({k40, "--format", "csv", "--signals", "alpha,alpha3"},
                   "--signals: \"alpha3\" is not allowed, it has been given before" + help);
     expectRefused({k40, "--format", "csv", "--units", "1x"},
-                  "--units: \"1x\" is not allowed, allowed are numbers of units, from 0" + help);
+                  "--units: \"1x\" is not allowed, expected unit numbers, from 0" + help);
     expectRefused({k40, "--format", "csv", "--units", "1"},
                   "--units: unit 1 computes nothing of a block of 40 bits with --num-pu 2, unit 0 does");
     expectRefused({vectors("k1024.csv"), "--format", "vcd", "--num-pu", "8", "--units", "0,8"},
                   "--units: unit 8 computes nothing of a block of 1024 bits with --num-pu 8, units 0 to 7 do");
-    expectRefused({k40, "--format", "fst"}, "--format: \"fst\" is not allowed, allowed are text, csv, vcd, npy" + help);
-    const std::string own = "--signals and --units need --format csv, vcd or npy: the text is the library's own";
+    expectRefused({k40, "--format", "fst"}, "--format: \"fst\" is not allowed, expected text, csv, vcd or npy" + help);
+    const std::string own =
+        "--signals and --units need --format csv, vcd or npy: they do not apply to the library's own text";
     expectRefused({k40, "--units", "0"}, own);
     expectRefused({k40, "--signals", "llr"}, own);
-    expectRefused({k40, "--format", "npy"}, "--format npy needs a regular file, by --output FILE");
+    expectRefused({k40, "--format", "npy"}, "--format npy needs a regular file; use --output FILE");
 }
 
 TEST_F(Trace, TellsWhatIsWrongWithFiles)
@@ -307,20 +308,20 @@ TEST_F(Trace, TellsWhatIsWrongWithFiles)
     expectRefused({"nowhere.csv"}, "nowhere.csv: cannot be opened: No such file or directory");
     expectRefused({k40, "--block", "8"}, k40 + ": has 8 blocks, there is no block 8");
     morvik.write("short.csv", header + '\n' + zeroRows("0", 45));
-    expectRefused({"short.csv"},
-                  "short.csv:2: block of 45 rows, allowed are K + 4 rows, K being one of the block sizes of 3GPP TS "
-                  "36.212 (40 to 6144)");
+    expectRefused(
+        {"short.csv"},
+        "short.csv:2: block of 45 rows, expected K + 4 rows, where K is a block size of 3GPP TS 36.212 (40 to 6144)");
     morvik.write("tail.csv", header + '\n' + zeroRows("0", 2));
     EXPECT_EQ(trace({"tail.csv"}).err.rfind("morvik trace: tail.csv:2: block of 2 rows, ", 0), 0U);
     morvik.write("in.csv", header + '\n' + zeroRows("0", 44));
     expectRefused({"in.csv", "--output", "in.csv"},
-                  "in.csv: is read as in.csv, its traced values need a file of their own");
+                  "in.csv: is read as in.csv, traced values need a file of their own");
     EXPECT_EQ(morvik.read("in.csv"), header + '\n' + zeroRows("0", 44));
     for (const std::string format : {"text", "csv", "vcd", "npy"}) {
         expectRefused({"in.csv", "--format", format, "--output", "nowhere/out"},
                       "nowhere/out: cannot be written: No such file or directory");
         expectRefused({"in.csv", "--format", format, "--output", "/dev/full"},
-                      format == "npy" ? "--format npy needs a regular file, by --output FILE"
+                      format == "npy" ? "--format npy needs a regular file; use --output FILE"
                                       : "/dev/full: cannot be written: No space left on device");
     }
     for (const std::string format : {"text", "csv", "vcd"}) {

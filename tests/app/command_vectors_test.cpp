@@ -126,29 +126,29 @@ TEST_F(Vectors, TellsADifference)
 
 TEST_F(Vectors, RefusesWhatIsNotAllowed)
 {
-    const std::string help = "; 'morvik vectors --help' tells what is allowed";
-    const std::string required =
-        "--out and --block-size, or --check, are required; 'morvik vectors --help' tells what is allowed";
+    const std::string help = "; see 'morvik vectors --help'";
+    const std::string required = "--out and --block-size, or --check, are required; see 'morvik vectors --help'";
     expectRefused({}, required);
     expectRefused({"--out", "set"}, required);
     expectRefused({"--block-size", "40"}, required);
     expectRefused({"--out", "set", "--check", "set"}, "--out excludes --check" + help);
     expectRefused({"--check", "set", "--num-pu", "8"},
-                  "--num-pu is for making a set, --check takes all from the manifest");
-    expectRefused({"--check", "set", "--soft"}, "--soft is for making a set, --check takes all from the manifest");
+                  "--num-pu cannot be combined with --check, which takes it from the manifest");
+    expectRefused({"--check", "set", "--soft"},
+                  "--soft cannot be combined with --check, which takes it from the manifest");
     expectRefused(
         {"--out", "set", "--block-size", "41"},
         "--block-size: \"41\" is not allowed, the nearest block sizes of 3GPP TS 36.212 are 40 and 48" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--format", "memh,vhdl"},
-                  "--format: \"vhdl\" is not allowed, allowed are memh, csv, npy, c" + help);
+                  "--format: \"vhdl\" is not allowed, expected memh, csv, npy or c" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--width", "12"},
-                  "--width: \"12\" is not allowed, allowed are 8, 16" + help);
+                  "--width: \"12\" is not allowed, expected 8 or 16" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--streams", "both"},
-                  "--streams: \"both\" is not allowed, allowed are packed, separate" + help);
+                  "--streams: \"both\" is not allowed, expected packed or separate" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--ebn0", "1dB"},
-                  "--ebn0: \"1dB\" is not allowed, allowed are -50 to 50 dB, with at most three decimals" + help);
+                  "--ebn0: \"1dB\" is not allowed, expected -50 to 50 dB, with at most three decimals" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--seed", "-1"},
-                  "--seed: \"-1\" is not allowed, allowed are the integers from 0 to 18446744073709551615" + help);
+                  "--seed: \"-1\" is not allowed, expected an integer from 0 to 18446744073709551615" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--blocks", "0", "--no-directed"},
                   "--blocks 0 and --no-directed together leave no block");
     expectRefused({"--check", "nowhere"}, "nowhere/manifest.json: cannot be opened: No such file or directory");

@@ -12,14 +12,13 @@ using namespace std::string_literals;
 
 TEST(FileKind, KnowsWhatIsNoText)
 {
-    EXPECT_STREQ(whyNoText("\x1F\x8B\x08\x08\xC0"s), "is compressed by gzip; 'gunzip FILE' unpacks it");
-    EXPECT_STREQ(whyNoText("\xFD\x37zXZ\0\0\x04"s), "is compressed by xz; 'unxz FILE' unpacks it");
-    EXPECT_STREQ(whyNoText("\x28\xB5\x2F\xFD\x24"s), "is compressed by zstd; 'unzstd FILE' unpacks it");
-    EXPECT_STREQ(whyNoText("BZh91AY&SY"s), "is compressed by bzip2; 'bunzip2 FILE' unpacks it");
+    EXPECT_STREQ(whyNoText("\x1F\x8B\x08\x08\xC0"s), "is compressed with gzip; unpack it by 'gunzip FILE'");
+    EXPECT_STREQ(whyNoText("\xFD\x37zXZ\0\0\x04"s), "is compressed with xz; unpack it by 'unxz FILE'");
+    EXPECT_STREQ(whyNoText("\x28\xB5\x2F\xFD\x24"s), "is compressed with zstd; unpack it by 'unzstd FILE'");
+    EXPECT_STREQ(whyNoText("BZh91AY&SY"s), "is compressed with bzip2; unpack it by 'bunzip2 FILE'");
     EXPECT_STREQ(whyNoText("\0\0\0\0\0\0\0\x01\x49\0"s),
-                 "is an FST waveform; 'fst2vcd FILE > FILE.vcd' of GTKWave makes a VCD of it");
-    EXPECT_STREQ(whyNoText("\xFF\xFE$\0d\0"s),
-                 "is in UTF-16; 'iconv -f UTF-16 -t UTF-8 FILE > NEW' makes a text of it");
+                 "is an FST waveform; convert it by GTKWave's 'fst2vcd FILE > FILE.vcd'");
+    EXPECT_STREQ(whyNoText("\xFF\xFE$\0d\0"s), "is in UTF-16; convert it by 'iconv -f UTF-16 -t UTF-8 FILE > NEW'");
 }
 
 TEST(FileKind, TakesAnythingElseForAText)

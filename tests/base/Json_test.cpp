@@ -66,7 +66,7 @@ TEST(Json, OfManyLevelsIsRefusedWhereTheyBegin)
 
 TEST(Json, ThatNamesAMemberTwiceIsRefused)
 {
-    EXPECT_EQ(refusal("{\"seed\": 1,\n\"seed\": 2}"), "a.json:2: \"seed\" is there twice");
+    EXPECT_EQ(refusal("{\"seed\": 1,\n\"seed\": 2}"), "a.json:2: \"seed\" appears twice");
     EXPECT_EQ(refusal(R"([{"a": {"a": 1}}, {"a": 1}])"), "none");
 }
 
@@ -109,14 +109,14 @@ TEST(Json, MembersAreWhatIsExpectedOfThem)
     EXPECT_TRUE(members.list("l").empty());
     EXPECT_FALSE(members.has("m"));
 
-    const std::string allowed = ", allowed are the integers 6 to 7";
+    const std::string allowed = ", expected an integer from 6 to 7";
     EXPECT_EQ(refusalOf([&] { members.integer("n", 6, 7); }), "a.json: row 1: \"n\" is 5" + allowed);
     EXPECT_EQ(refusalOf([&] { members.integer("x", 6, 7); }), "a.json: row 1: \"x\" is 1.5" + allowed);
     EXPECT_EQ(refusalOf([&] { members.integer("negative", 6, 7); }), "a.json: row 1: \"negative\" is -1" + allowed);
     EXPECT_EQ(refusalOf([&] { members.integer("big", 0, UINT64_MAX); }).substr(0, 44),
               "a.json: row 1: \"big\" is 1.8446744073709552e+");
-    EXPECT_EQ(refusalOf([&] { members.text("l"); }), "a.json: row 1: \"l\" is a list, expected a text");
-    EXPECT_EQ(refusalOf([&] { members.flag("n"); }), "a.json: row 1: \"n\" is 5, allowed are true and false");
+    EXPECT_EQ(refusalOf([&] { members.text("l"); }), "a.json: row 1: \"l\" is a list, expected a string");
+    EXPECT_EQ(refusalOf([&] { members.flag("n"); }), "a.json: row 1: \"n\" is 5, expected true or false");
     EXPECT_EQ(refusalOf([&] { members.number("t"); }), "a.json: row 1: \"t\" is \"text\", expected a number");
     EXPECT_EQ(refusalOf([&] { members.list("n"); }), "a.json: row 1: \"n\" is 5, expected a list");
     EXPECT_EQ(refusalOf([&] { members.at("m"); }), "a.json: row 1: lacks \"m\"");

@@ -63,7 +63,7 @@ TEST(LineReader, TakesLinesWithAnyEnd)
 
 TEST(LineReader, BoundsTheLengthOfLines)
 {
-    const std::string tooLong = "line is too long, allowed are 10 characters";
+    const std::string tooLong = "line is longer than 10 characters";
     EXPECT_EQ(linesOf("0123456789\n0123456789\r\n0123456789").size(), 3U);
     EXPECT_EQ(linesOf("\xEF\xBB\xBF"
                       "0123456789\r\n")
@@ -90,7 +90,7 @@ TEST(LineReader, TakesLinesOfAllLengthsAroundItsBuffer)
 
 TEST(LineReader, TellsThePlace)
 {
-    EXPECT_EQ(refusal("\x1F\x8B\n"), "a.txt: is compressed by gzip; 'gunzip FILE' unpacks it");
+    EXPECT_EQ(refusal("\x1F\x8B\n"), "a.txt: is compressed with gzip; unpack it by 'gunzip FILE'");
     EXPECT_EQ(refusal("a\n\x1F\x8B\n"), "none") << "the first line tells";
     std::istringstream broken("a\n");
     broken.setstate(std::ios::badbit);

@@ -1,4 +1,4 @@
-// OutputFile: files are replaced as a whole, or not at all; what is no regular file is written to.
+// OutputFile: files are replaced as a whole, or not at all; what is not a regular file is written to.
 #include "base/OutputFile.h"
 
 #include <fcntl.h>

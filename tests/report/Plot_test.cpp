@@ -102,7 +102,7 @@ TEST_F(Plot, CheckingLeavesNothing)
 
 TEST_F(Plot, RefusesOtherSuffixes)
 {
-    const std::string words = ": a plot's format is known by its suffix, allowed are .svg, .png and .pdf";
+    const std::string words = ": a plot's format follows from its suffix, expected .svg, .png or .pdf";
     for (const char* const name : {"a.jpg", "a", "a.svg.gz", "a.SVG", ".svg"}) {
         EXPECT_EQ(sayings(path(name)), path(name) + words);
     }
@@ -120,10 +120,9 @@ TEST_F(Plot, RefusesPlacesWhereNothingCanBeWritten)
 TEST_F(Plot, SaysWhenGnuplotIsMissing)
 {
     const ProgramsIn programs(itsFiles.path());
-    EXPECT_EQ(
-        sayings(path("a.svg")),
-        path("a.svg") +
-            ": is drawn by gnuplot (Debian's package gnuplot-nox), which cannot be started: No such file or directory");
+    EXPECT_EQ(sayings(path("a.svg")),
+              path("a.svg") +
+                  ": needs gnuplot (Debian package gnuplot-nox), which cannot be started: No such file or directory");
     EXPECT_TRUE(itsFiles.names().empty());
 }
 
@@ -142,7 +141,7 @@ TEST_F(Plot, SaysWhatGnuplotSaysAndKeepsWhatWasThere)
 TEST_F(Plot, SaysWhenGnuplotWasEndedByASignal)
 {
     const ProgramsIn programs(folderWith("gnuplot", "#!/bin/sh\nkill -9 $$\n"));
-    EXPECT_EQ(sayings(path("a.png")), path("a.png") + ": cannot be drawn: gnuplot did not end well");
+    EXPECT_EQ(sayings(path("a.png")), path("a.png") + ": cannot be drawn: gnuplot failed");
 }
 
 TEST_F(Plot, ReplacesWhatWasThereWhereALinkLeads)

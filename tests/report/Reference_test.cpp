@@ -151,7 +151,7 @@ TEST_F(Reference, LocalesHaveNoSay)
     const CommaLocale locale;
     EXPECT_EQ(read("ebn0_db,ber,block_size\n1.5,1.5e-3,6144\n").at(0).title, "rates: K = 6144");
     expectRefused("ebn0_db,ber\n0,2.5\n",
-                  ":2: \"2.5\" in the column ber is not allowed, allowed are numbers from 0 to 1");
+                  ":2: \"2.5\" in the column ber is not allowed, expected a number from 0 to 1");
 }
 
 TEST_F(Reference, TakesTransportBlocksOverEsN0)
@@ -183,8 +183,8 @@ TEST_F(Reference, RefusesFilesThatCannotBeRead)
 
 TEST_F(Reference, RefusesFilesWithoutRates)
 {
-    expectRefused("", ": has no line that names columns");
-    expectRefused("# title: nothing\n\n", ": has no line that names columns");
+    expectRefused("", ": has no header line");
+    expectRefused("# title: nothing\n\n", ": has no header line");
     expectRefused("ebn0_db,ber\n", ": has no row of error rates");
 }
 
@@ -195,7 +195,7 @@ TEST_F(Reference, RefusesOtherColumns)
     expectRefused("0.0,1e-1,1e-2\n", ":1: " + words);
     expectRefused("# a\nebn0_db,rate\n", ":2: " + words);
     expectRefused("ber,fer\n", ":1: " + words);
-    expectRefused("ebn0_db,ber,ber\n", ":1: column \"ber\" is there twice");
+    expectRefused("ebn0_db,ber,ber\n", ":1: column \"ber\" appears twice");
 }
 
 TEST_F(Reference, RefusesRowsThatDoNotFit)
@@ -223,22 +223,22 @@ TEST_F(Reference, RefusesRunsThatCannotBe)
 {
     const auto expectNone = [this](const std::string& column, const std::string& field, const std::string& allowed) {
         expectRefused("ebn0_db,ber,blocks," + column + "\n0,0.1,10," + field + '\n',
-                      ":2: \"" + field + "\" in the column " + column + " is not allowed, allowed are " + allowed);
+                      ":2: \"" + field + "\" in the column " + column + " is not allowed, expected " + allowed);
     };
     for (const char* const size : {"41", "0", "6145"}) {
-        expectNone("block_size", size, "the block sizes of 3GPP TS 36.212, 40 to 6144");
+        expectNone("block_size", size, "a block size of 3GPP TS 36.212, 40 to 6144");
     }
     for (const char* const units : {"0", "3", "16"}) {
         expectNone("num_pu", units, "2, 4 and 8");
     }
     for (const char* const seconds : {"nan", "-0.1", "inf", "1e13", "soon"}) {
-        expectNone("seconds", seconds, "the numbers from 0 to 1e+12");
+        expectNone("seconds", seconds, "a number from 0 to 1e+12");
     }
     for (const char* const seed : {"-1", "1.5", "18446744073709551616"}) {
-        expectNone("seed", seed, "the integers 0 to 18446744073709551615");
+        expectNone("seed", seed, "an integer from 0 to 18446744073709551615");
     }
     for (const char* const frames : {"all", "9:0", "0:9", "0:5 4:9"}) {
-        expectNone("frames", frames, "a number, or ranges FROM:TO of as many frames as there are blocks");
+        expectNone("frames", frames, "a number, or ranges FROM:TO with as many frames as there are blocks");
     }
     const std::string header = "ebn0_db,ber,blocks,block_size,num_pu,seconds,seed,frames\n";
     EXPECT_EQ(read(header + "0,0.1,10,40,2,0,1,0:10\n1,0.1,10,40,2,1.5,1,0:4 6:12\n2,0.1,10,,,,,10\n").size(), 2U);
@@ -247,10 +247,10 @@ TEST_F(Reference, RefusesRunsThatCannotBe)
 TEST_F(Reference, RefusesValuesThatAreNone)
 {
     const std::string header = "ebn0_db,ber,frames\n";
-    const std::string rates = " in the column ber is not allowed, allowed are numbers from 0 to 1";
+    const std::string rates = " in the column ber is not allowed, expected a number from 0 to 1";
     const std::string counts =
-        " in the column blocks is not allowed, allowed are the integers 0 to 18446744073709551615";
-    const std::string places = " in the column ebn0_db is not allowed, allowed are numbers from -1000 to 1000";
+        " in the column blocks is not allowed, expected an integer from 0 to 18446744073709551615";
+    const std::string places = " in the column ebn0_db is not allowed, expected a number from -1000 to 1000";
     expectRefused(header + "0,high,1\n", ":2: \"high\"" + rates);
     expectRefused(header + "0,1.01,1\n", ":2: \"1.01\"" + rates);
     expectRefused(header + "0,-0.1,1\n", ":2: \"-0.1\"" + rates);
@@ -265,7 +265,7 @@ TEST_F(Reference, RefusesValuesThatAreNone)
     expectRefused(header + "1e4,0.1,1\n", ":2: \"1e4\"" + places);
     expectRefused(
         "ebn0_db,ber,block_size\n0,0.1,4294967296\n",
-        ":2: \"4294967296\" in the column block_size is not allowed, allowed are the integers 0 to 4294967295");
+        ":2: \"4294967296\" in the column block_size is not allowed, expected an integer from 0 to 4294967295");
 }
 
 }  // namespace

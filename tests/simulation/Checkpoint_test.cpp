@@ -124,11 +124,11 @@ TEST(Checkpoint, IsTakenOnNoTrustThoughItsChecksumIsRight)
               "a.checkpoint:2: character 33 opens more than 32 levels of lists and objects");
     EXPECT_EQ(refusal("{"), "a.checkpoint:2: no JSON, character 2 is not expected there");
     EXPECT_EQ(refusal("{}"), "a.checkpoint: lacks \"version\"");
-    EXPECT_NE(refusal(good.substr(0, 2) + "\"version\": \"2\", " + good.substr(2)).find(": \"version\" is there twice"),
+    EXPECT_NE(refusal(good.substr(0, 2) + "\"version\": \"2\", " + good.substr(2)).find(": \"version\" appears twice"),
               std::string::npos);
     EXPECT_EQ(
         with("\"blocks\": 500", "\"blocks\": 18446744073709551615"),
-        "a.checkpoint: begun 1: \"blocks\" is 18446744073709551615, allowed are the integers 0 to 281474976710656");
+        "a.checkpoint: begun 1: \"blocks\" is 18446744073709551615, expected an integer from 0 to 281474976710656");
     EXPECT_EQ(with("\"blocks\": 500", "\"blocks\": -1").substr(0, 38), "a.checkpoint: begun 1: \"blocks\" is -1,");
     EXPECT_EQ(with("\"seconds\": 1.5", "\"seconds\": -1.5"),
               "a.checkpoint: begun 1: \"seconds\" is -1.5, which is no time of a run");
@@ -138,7 +138,7 @@ TEST(Checkpoint, IsTakenOnNoTrustThoughItsChecksumIsRight)
     EXPECT_EQ(with("\"errors\": \\[", "\"errors\": 1, \"other\": ["),
               "a.checkpoint: begun 1: \"errors\" is 1, expected a list");
     EXPECT_EQ(with("\"failures\": \\[", "\"failures\": [0, "),
-              "a.checkpoint: begun 1: errors: \"failures\" is a list, allowed are 10 numbers of frames at most");
+              "a.checkpoint: begun 1: errors: \"failures\" is a list, expected at most 10 frame numbers");
 }
 
 }  // namespace

@@ -210,13 +210,13 @@ TEST_F(ResultFiles, MayHaveAByteOrderMarkAndBlanks)
 
 TEST_F(ResultFiles, ThatAreNoTextAreRefused)
 {
-    EXPECT_EQ(refusal("a.csv", "\x1f\x8b\x08..."), "a.csv: is compressed by gzip; 'gunzip FILE' unpacks it");
+    EXPECT_EQ(refusal("a.csv", "\x1f\x8b\x08..."), "a.csv: is compressed with gzip; unpack it by 'gunzip FILE'");
     std::filesystem::create_symlink("/dev/zero", folder.path("endless.csv"));
     try {
         readResults(folder.path("endless.csv"));
         FAIL() << "accepted";
     } catch (const morvik::base::Error& error) {
-        EXPECT_EQ(error.what(), folder.path("endless.csv") + ": is no text, it has a null character");
+        EXPECT_EQ(error.what(), folder.path("endless.csv") + ": is not text, it has a null character");
     }
 }
 

@@ -158,26 +158,26 @@ std::vector<Accident> signAccidents()
 std::vector<Accident> orderAccidents()
 {
     return {{"order",
-             "the rows are in reversed order, tail first",
+             "the rows are reversed, tail first",
              [](SentFrame& f) {
                  for (Stream* stream : streamsOf(f)) {
                      std::reverse(stream->begin(), stream->end());
                  }
              }},
             {"order",
-             "the rows of the data are in reversed order, those of the tail are not",
+             "the data rows are reversed, the tail rows are not",
              [](SentFrame& f) {
                  for (Stream* stream : streamsOf(f)) {
                      std::reverse(stream->begin(), stream->end() - 4);
                  }
              }},
             {"order",
-             "the reference has the bits in reversed order",
+             "the bits of the reference are reversed",
              [](SentFrame& f) {
                  std::reverse(f.bits.begin(), f.bits.end());
              }},
             {"order",
-             "the reference has the bits of each byte in reversed order",
+             "the bits of each byte of the reference are reversed",
              [](SentFrame& f) {
                  for (auto byte = f.bits.begin(); byte != f.bits.end(); byte += 8) {
                      std::reverse(byte, byte + 8);
@@ -200,16 +200,16 @@ std::vector<Accident> rowAccidents()
                  }
              }},
             {"rows",
-             "rows follow after the block",
+             "there are extra rows after the block",
              [](SentFrame& f) {
                  insertRows(f, f.bits.size() + 4, 20);
              }},
             {"rows",
-             "rows stand before the block",
+             "there are extra rows before the block",
              [](SentFrame& f) {
                  insertRows(f, 0, 20);
              }},
-            {"rows", "rows stand between data and tail", [](SentFrame& f) {
+            {"rows", "there are extra rows between data and tail", [](SentFrame& f) {
                  insertRows(f, f.bits.size(), 20);
              }}};
 }

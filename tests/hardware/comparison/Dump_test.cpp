@@ -50,13 +50,13 @@ TEST(Dump, RefusesWhatHasNoEndOrIsNoText)
 {
     for (const Reader reader : {readCsv, readVcd}) {
         using namespace std::string_literals;
-        const std::string tooLong = "dump:1: line is too long, allowed are 1048576 characters";
+        const std::string tooLong = "dump:1: line is longer than 1048576 characters";
         expectEndlessRefused(reader, "\0"s, tooLong);
         expectEndlessRefused(reader, "$comment ", tooLong);
-        expectRefused(reader, "\x1F\x8B\x08\n", "dump: is compressed by gzip; 'gunzip FILE' unpacks it");
+        expectRefused(reader, "\x1F\x8B\x08\n", "dump: is compressed with gzip; unpack it by 'gunzip FILE'");
         expectRefused(reader,
                       "\0\0\0\0\0\0\0\x01\x49\0"s,
-                      "dump: is an FST waveform; 'fst2vcd FILE > FILE.vcd' of GTKWave makes a VCD of it");
+                      "dump: is an FST waveform; convert it by GTKWave's 'fst2vcd FILE > FILE.vcd'");
     }
     expectEndlessRefused(readVcd, "\n", "dump:1000001: more than 1000000 blank lines");
 }
@@ -125,25 +125,24 @@ TEST(CsvDump, NamesThePlaceOfAMistake)
 {
     const std::string numbers =
         " is not allowed, expected an integer from -2048 to 2047, or a multiple of 1/8 with a point from -256.0 to "
-        "255.875; a map tells other forms";
+        "255.875; use a map for other forms";
     expectRefused(readCsv, "", "dump:1: no header, expected the columns half_iteration, step, signal, value");
     expectRefused(readCsv, "a,b\n", R"(dump:1: no column "half_iteration" in the header "a,b")");
     expectRefused(readCsv, "half_iteration,step,llr,g0,llr\n", R"(dump:1: two columns are llr, "llr" and "llr")");
     expectRefused(readCsv, header + "0,0,llr\n", "dump:2: 3 fields, expected the 4 of the header");
-    expectRefused(readCsv,
-                  header + "0,0,LLR,1\n",
-                  R"(dump:2: signal "LLR" is not known; a map tells which it is, or that it does not count)");
+    expectRefused(
+        readCsv, header + "0,0,LLR,1\n", R"(dump:2: signal "LLR" is not known; use a map to name it, or to ignore it)");
     expectRefused(
         readCsv,
         header + "2,0,llr,1\n",
-        R"(dump:2: half-iteration "2" is not allowed, allowed are the integers 0 to 1; a map tells when they count from 1)");
+        R"(dump:2: half-iteration "2" is not allowed, expected an integer from 0 to 1; use a map if they count from 1)");
     expectRefused(readCsv,
                   header + "3,0,llr,1\n",
-                  R"(dump:2: half-iteration "3" is not allowed, allowed are the integers 0 to 1)");
+                  R"(dump:2: half-iteration "3" is not allowed, expected an integer from 0 to 1)");
     expectRefused(
         readCsv,
         header + "0,43,llr,1\n",
-        R"(dump:2: step "43" is not allowed, allowed are the integers 0 to 42; a map tells when they count from 1)");
+        R"(dump:2: step "43" is not allowed, expected an integer from 0 to 42; use a map if they count from 1)");
     expectRefused(readCsv, header + "0,0,llr,2048\n", R"(dump:2: llr "2048")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,0.1\n", R"(dump:2: llr "0.1")" + numbers);
     expectRefused(readCsv, header + "0,0,llr,q\n", R"(dump:2: llr "q")" + numbers);
@@ -192,7 +191,7 @@ TEST(CsvDump, RefusesAMapOfWhatItLacks)
     const std::string text = header + "0,0,llr,5\n";
     expectRefused(readCsv,
                   text,
-                  "dump: is CSV, of which all rows count; \"valid\" in a map is for VCD",
+                  "dump: is CSV, where every row counts; \"valid\" in a map is for VCD",
                   mapOf(R"({"valid": "ok"})"));
     const std::string columns = "half_iteration,step,llr,ratio\n";
     const std::string lacking = "dump: has no signal \"ratios\", which the map calls extrinsic";
@@ -209,46 +208,44 @@ TEST(CsvDump, RefusesAMapOfWhatItLacks)
 
 TEST(NameMap, HasAnEndAndIsText)
 {
-    expectMapRefused(std::string((1U << 20) + 1, ' '), "map.json: is too large, allowed are 1048576 bytes");
-    expectMapRefused(std::string(100000, '\0'), "map.json: is no text, it has a null character");
-    expectMapRefused("\x1f\x8b{}", "map.json: is compressed by gzip; 'gunzip FILE' unpacks it");
+    expectMapRefused(std::string((1U << 20) + 1, ' '), "map.json: is larger than 1048576 bytes");
+    expectMapRefused(std::string(100000, '\0'), "map.json: is not text, it has a null character");
+    expectMapRefused("\x1f\x8b{}", "map.json: is compressed with gzip; unpack it by 'gunzip FILE'");
     EXPECT_EQ(mapOf("\xEF\xBB\xBF{\"first_step\": 1}\r\n" + std::string(1000000, ' ')).firstStep, 1U);
 }
 
 TEST(NameMap, NamesWhatIsWrong)
 {
-    expectMapRefused("[]", "map.json: no map, expected a JSON object");
+    expectMapRefused("[]", "map.json: not a map, expected a JSON object");
     expectMapRefused("{", "map.json:1: no JSON, character 2 is not expected there");
     expectMapRefused("{\"bits\": 16,\n \"valid\" \"on\"}", "map.json:2: no JSON, character 13 is not expected there");
     expectMapRefused(R"({"signals": )" + std::string(100000, '[') + '}',
                      "map.json:1: character 44 opens more than 32 levels of lists and objects");
-    expectMapRefused(R"({"bits": 16, "bits": 17})", "map.json:1: \"bits\" is there twice");
-    expectMapRefused(R"({"bits": [[1]]})", "map.json: \"bits\" is a list, allowed are the integers 8 to 32");
+    expectMapRefused(R"({"bits": 16, "bits": 17})", "map.json:1: \"bits\" appears twice");
+    expectMapRefused(R"({"bits": [[1]]})", "map.json: \"bits\" is a list, expected an integer from 8 to 32");
     expectMapRefused(R"({"signal": {}})",
-                     "map.json: \"signal\" is no key of a map, allowed are columns, signals, numbers, bits, "
-                     "first_half_iteration, first_step, valid");
-    expectMapRefused(
-        R"({"signals": {"a": "alpha8"}})",
-        "map.json: signal \"a\" is \"alpha8\", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to "
-        "beta7, llr, extrinsic, and null");
+                     "map.json: \"signal\" is not a key of a map, expected columns, signals, numbers, bits, "
+                     "first_half_iteration, first_step or valid");
+    expectMapRefused(R"({"signals": {"a": "alpha8"}})",
+                     "map.json: signal \"a\" is \"alpha8\", expected intrinsic, g0 to g3, alpha0 to alpha7, beta0 to "
+                     "beta7, llr, extrinsic, and null");
     for (const char* const list :
          {"[]", R"(["g0"])", R"(["g0", "g1"])", R"(["llr", "llr"])", R"(["g0", "g3", "g3"])"}) {
-        expectMapRefused(
-            std::string(R"({"signals": {"bm": )") + list + "}}",
-            "map.json: signal \"bm\" is a list, allowed are two signals that are always equal: g0 and g3, or "
-            "g1 and g2");
+        expectMapRefused(std::string(R"({"signals": {"bm": )") + list + "}}",
+                         "map.json: signal \"bm\" is a list, expected two signals that are always equal: g0 and g3, or "
+                         "g1 and g2");
     }
-    expectMapRefused(R"({"signals": 1})", "map.json: \"signals\" is no object");
+    expectMapRefused(R"({"signals": 1})", "map.json: \"signals\" is not an object");
     expectMapRefused(R"({"columns": {"row": "x"}})",
-                     "map.json: column \"row\", allowed are half_iteration, step, signal, value");
+                     "map.json: column \"row\", expected half_iteration, step, signal or value");
     expectMapRefused(R"({"columns": {"step": 1}})", "map.json: \"step\" is no text");
     expectMapRefused(R"({"numbers": "octal"})",
-                     "map.json: \"numbers\" is \"octal\", allowed are auto, integer, unsigned, real, hex, binary");
+                     "map.json: \"numbers\" is \"octal\", expected auto, integer, unsigned, real, hex or binary");
     expectMapRefused(R"({"valid": ""})", "map.json: \"valid\" is empty");
-    expectMapRefused(R"({"bits": 64})", "map.json: \"bits\" is 64, allowed are the integers 8 to 32");
-    expectMapRefused(R"({"bits": {"g0": 7}})", "map.json: \"g0\" is 7, allowed are the integers 8 to 32");
+    expectMapRefused(R"({"bits": 64})", "map.json: \"bits\" is 64, expected an integer from 8 to 32");
+    expectMapRefused(R"({"bits": {"g0": 7}})", "map.json: \"g0\" is 7, expected an integer from 8 to 32");
     expectMapRefused(R"({"bits": {"g": 8}})",
-                     "map.json: bits of \"g\", allowed are intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, "
+                     "map.json: bits of \"g\", expected intrinsic, g0 to g3, alpha0 to alpha7, beta0 to beta7, llr, "
                      "extrinsic");
 }
 

@@ -202,8 +202,8 @@ TEST(VcdDump, RefusesTwoScopesWithTheSameRow)
     EXPECT_EQ(read(readVcd, start + "b10 s1\nb11 s2\n").values.at({0, llr, 3}), 6);
     expectRefused(readVcd,
                   start + "b1 s1\nb10 s2\n",
-                  "dump:23: tb.ref.llr and tb.dut.llr both have llr of half-iteration 0, step 1; a map chooses one, or "
-                  "tells by \"valid\" when they count");
+                  "dump:23: tb.ref.llr and tb.dut.llr both have llr of half-iteration 0, step 1; use a map to choose "
+                  "one, or \"valid\" to tell when they count");
     EXPECT_EQ(read(readVcd, start + "b1 s1\nbx l1\n").values.at({0, llr, 1}), 6);
 }
 
@@ -297,7 +297,7 @@ TEST(VcdDump, TellsElementsAndScopesApart)
     const NameMap none = mapOf(R"({"signals": {"ratio.data": "llr", "core.ratio.data": null}})");
     expectRefused(readVcd,
                   "$scope module core $end\n" + data + "$upscope $end\n$enddefinitions $end\n",
-                  "dump:6: no variable of the dump is a signal that is known; a map tells which is which",
+                  "dump:6: no variable of the dump is a known signal; use a map to name them",
                   none);
 }
 
@@ -307,28 +307,27 @@ TEST(VcdDump, NamesThePlaceOfAMistake)
     const std::string pass = "$var wire 5 h half_iteration $end\n";
     const std::string ratio = "$var wire 16 l llr $end\n";
     const std::string end = "$upscope $end\n$enddefinitions $end\n";
-    expectRefused(readVcd,
-                  start + pass + end,
-                  "dump:5: no variable of the dump is a signal that is known; a map tells which is which");
+    expectRefused(
+        readVcd, start + pass + end, "dump:5: no variable of the dump is a known signal; use a map to name them");
     expectRefused(readVcd,
                   start + ratio + end + "#0\nb1 s\nb1 l\n",
                   R"(dump:7: no variable "half_iteration" in the scope of "core.llr" or around it)");
     expectRefused(readVcd,
                   "$timescale 1 hour $end\n",
                   R"(dump:1: timescale "1hour" is not allowed, expected 1, 10 or 100 and s, ms, us, ns, ps or fs)");
-    expectRefused(readVcd, start + pass + ratio + end + "#1x\n", R"(dump:7: "#1x" is no time)");
+    expectRefused(readVcd, start + pass + ratio + end + "#1x\n", R"(dump:7: "#1x" is not a time)");
     expectRefused(
-        readVcd, start + pass + ratio + "#0\nb0 h\n" + ratio, R"(dump:7: variable "llr" behind the first values)");
+        readVcd, start + pass + ratio + "#0\nb0 h\n" + ratio, R"(dump:7: variable "llr" after the first values)");
     expectRefused(readVcd,
                   start + pass + ratio + "$var wire 5 k half_iteration $end\n",
                   R"(dump:5: two variables are "core.half_iteration")");
     expectRefused(readVcd, start + pass + ratio + end + "#0\nb1 q\n", R"(dump:8: no variable has the identifier "q")");
-    expectRefused(readVcd, start + pass + ratio + end + "hello\n", R"(dump:7: "hello" is no change of a value)");
+    expectRefused(readVcd, start + pass + ratio + end + "hello\n", R"(dump:7: "hello" is not a value change)");
     expectRefused(readVcd, start + "$comment", "dump:3: a command without $end");
     expectRefused(readVcd, "$upscope $end\n", "dump:1: $upscope outside of all scopes");
     expectRefused(readVcd,
                   start + pass + ratio + end + "#0\nb0 h\nb1111111 s\nb1 l\n",
-                  R"(dump:10: step "127" is not allowed, allowed are the integers 0 to 42)");
+                  R"(dump:10: step "127" is not allowed, expected an integer from 0 to 42)");
     expectRefused(readVcd,
                   start + pass + ratio + end + "#0\nb0 h\nb1 s\nb0111111111111111 l\n",
                   "dump:10: llr 32767 is not allowed, expected -2048 to 2047 eighths");

@@ -109,7 +109,7 @@ TEST(Diagnosis, TellsWhichStreamDoesNotBelong)
     const Diagnosis diagnosis = diagnose(casesOf(frames), with(2));
     EXPECT_EQ(diagnosis.verdict, Verdict::strange);
     EXPECT_EQ(diagnosis.stranger, 2U);
-    EXPECT_NE(textOf(diagnosis).find("A stream does not belong: the signs of rsc2_par are wrong in "),
+    EXPECT_NE(textOf(diagnosis).find("A stream does not belong to these blocks: the signs of rsc2_par are wrong in "),
               std::string::npos);
 }
 

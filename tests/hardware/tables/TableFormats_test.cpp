@@ -168,7 +168,7 @@ TEST(TableFormats, MemhNamesThePlace)
     expectRefused(
         "memh", "pairs.memh", "// x\n\n17f\n17\n", "pairs.memh:4: word \"17\", expected 3 hexadecimal digits");
     expectRefused("memh", "pairs.memh", "1xf\n", "pairs.memh:1: word \"1xf\", expected 3 hexadecimal digits");
-    expectRefused("memh", "bits.memh", "0\n2\n", "bits.memh:2: bit 2 is not allowed, allowed are 0 to 1");
+    expectRefused("memh", "bits.memh", "0\n2\n", "bits.memh:2: bit 2 is not allowed, expected 0 to 1");
 }
 
 TEST(TableFormats, CsvNamesThePlace)
@@ -180,7 +180,7 @@ TEST(TableFormats, CsvNamesThePlace)
     expectRefused("csv", "pairs.csv", header + "0,1,2\n0,1,x\n", "pairs.csv:3: row \"0,1,x\"" + expected);
     expectRefused("csv", "pairs.csv", header + "0,1,2,3\n", "pairs.csv:2: row \"0,1,2,3\"" + expected);
     expectRefused(
-        "csv", "pairs.csv", header + "0,128,2\n", "pairs.csv:2: left 128 is not allowed, allowed are -128 to 127");
+        "csv", "pairs.csv", header + "0,128,2\n", "pairs.csv:2: left 128 is not allowed, expected -128 to 127");
 }
 
 TEST(TableFormats, CNamesThePlace)
@@ -193,22 +193,22 @@ TEST(TableFormats, CNamesThePlace)
                   beginning + "\n    {1, 2, 3},\n};\n",
                   "pairs.c:2: row \"    {1, 2, 3},\", expected 2 decimal integers as they were written");
     expectRefused(
-        "c", "pairs.c", beginning + "\n    {1, 16},\n};\n", "pairs.c:2: right 16 is not allowed, allowed are 0 to 15");
+        "c", "pairs.c", beginning + "\n    {1, 16},\n};\n", "pairs.c:2: right 16 is not allowed, expected 0 to 15");
 }
 
 TEST(TableFormats, NpyNamesThePlace)
 {
     const std::string good = written("npy", pairs, {{-128, 15}, {127, 1}}, "pairs.npy");
-    expectRefused("npy", "pairs.npy", "", "pairs.npy: is no array of NumPy as it was written");
+    expectRefused("npy", "pairs.npy", "", "pairs.npy: is not the NumPy array that was written");
     expectRefused("npy",
                   "pairs.npy",
                   written("npy", bits, {{1}}, "bits.npy"),
-                  "pairs.npy: is no array of NumPy as it was written");
+                  "pairs.npy: is not the NumPy array that was written");
     expectRefused("npy", "pairs.npy", good.substr(0, good.size() - 1), "pairs.npy: ends before row 1");
     expectRefused("npy", "pairs.npy", good + "x", "pairs.npy: has more numbers than its shape says");
     std::string wrong = good;
     wrong[131] = 16;
-    expectRefused("npy", "pairs.npy", wrong, "pairs.npy: row 1: right 16 is not allowed, allowed are 0 to 15");
+    expectRefused("npy", "pairs.npy", wrong, "pairs.npy: row 1: right 16 is not allowed, expected 0 to 15");
 }
 
 TEST(TableFormats, ReportAMissingFile)

@@ -72,7 +72,7 @@ TEST_F(SetFolder, LeavesFilesOfOthersAlone)
         FAIL() << "accepted";
     } catch (const morvik::base::Error& error) {
         EXPECT_EQ(error.what(),
-                  path() + "/stimulus.npy: is no file of the earlier set, and the new one has such a file");
+                  path() + "/stimulus.npy: is not a file of the earlier set, but the new set has one of this name");
     }
     EXPECT_EQ(read("stimulus.npy"), "mine, too");
 }
@@ -137,7 +137,7 @@ TEST_F(SetFolder, IsCompleteWhereverAProcessWasKilledWhileItPlacedOne)
         }
         if (steps > 0) {
             expectRefused(path() +
-                          ": has a set that is not placed yet; if its command was killed, the next 'morvik vectors "
+                          ": has a set that is not in place yet; if its command was killed, the next 'morvik vectors "
                           "--out' into this folder finishes it");
         }
         {
@@ -204,7 +204,7 @@ TEST_F(SetFolder, LeavesAloneWhatOthersKeepWhereUnfinishedOnesAre)
     std::filesystem::create_directory(path());
     std::filesystem::create_directory(folder.path("precious"));
     folder.write("precious/blocks.csv", "x");
-    const std::string noFolder = ": is no folder, and is left alone; remove it, or choose another folder";
+    const std::string noFolder = ": is not a folder; remove it or choose another folder";
     std::filesystem::create_symlink("../precious", aside);
     expectNotMade(aside + noFolder);
     std::filesystem::remove(aside);
@@ -216,7 +216,7 @@ TEST_F(SetFolder, LeavesAloneWhatOthersKeepWhereUnfinishedOnesAre)
     EXPECT_EQ(folder.read("precious/blocks.csv"), "x");
 
     folder.write("set/.morvik-unfinished/mine.txt", "x");
-    expectNotMade(aside + "/mine.txt: is no file of a set; " + aside + " is for unfinished ones alone");
+    expectNotMade(aside + "/mine.txt: is not a file of a set; " + aside + " is for unfinished ones alone");
     EXPECT_EQ(read(".morvik-unfinished/mine.txt"), "x");
 }
 

@@ -150,7 +150,7 @@ TEST_F(VectorSet, RefusesAFileThatIsNotTheOneWritten)
 {
     make();
     folder.write("set/expected.npy", read("expected.npy") + "x");
-    expectRefused(path() + "/expected.npy: is not the file that was written, its sha256 differs from the manifest");
+    expectRefused(path() + "/expected.npy: has changed since it was written: its sha256 differs from the manifest");
     std::filesystem::remove(path() + "/expected.npy");
     expectRefused("sha256sum: " + path() + "/expected.npy: No such file or directory");
 }
@@ -162,7 +162,7 @@ TEST_F(VectorSet, RefusesWhatHasNoEnd)
         const std::string file = path() + '/' + name;
         std::filesystem::rename(file, folder.path("kept"));
         std::filesystem::create_symlink("/dev/zero", file);
-        expectRefused(file + ": is no regular file");
+        expectRefused(file + ": is not a regular file");
         std::filesystem::remove(file);
         std::filesystem::rename(folder.path("kept"), file);
     }
@@ -174,7 +174,7 @@ TEST_F(VectorSet, RefusesTooFewAndTooManyRows)
     settings.formats = {"csv"};
     make();
     removeLine("stimulus.csv", 89);
-    expectRefused(path() + "/stimulus.csv:88: the rows of stimulus end too early for the blocks");
+    expectRefused(path() + "/stimulus.csv:88: the rows of stimulus end before the blocks do");
     make();
     removeLine("blocks.csv", 3);
     expectRefused(path() + "/stimulus.csv:46: has more rows of stimulus than the blocks need");
@@ -197,7 +197,7 @@ TEST_F(VectorSet, RefusesSoftValuesOfMoreThanEightBits)
     settings.width = 16;
     make();
     change("stimulus.csv", "\n0,-?\\d+,", "\n0,128,");
-    expectRefused(path() + "/stimulus.csv:2: rsc1_sys 128 is not allowed, allowed are -128 to 127");
+    expectRefused(path() + "/stimulus.csv:2: rsc1_sys 128 is not allowed, expected -128 to 127");
 }
 
 TEST_F(VectorSet, RefusesAManifestThatIsNone)
@@ -213,28 +213,28 @@ TEST_F(VectorSet, RefusesAManifestThatIsNone)
         };
     expectManifestRefused("\"iterations\": 2",
                           "\"iterations\": 16",
-                          "parameters: \"iterations\" is 16, allowed are the integers 1 to 15");
+                          "parameters: \"iterations\" is 16, expected an integer from 1 to 15");
     expectManifestRefused("\"iterations\": 2",
                           "\"iterations\": 2.5",
-                          "parameters: \"iterations\" is 2.5, allowed are the integers 1 to 15");
+                          "parameters: \"iterations\" is 2.5, expected an integer from 1 to 15");
     expectManifestRefused("\"iterations\": 2",
                           "\"iterations\": 1e30",
-                          "parameters: \"iterations\" is 1e+30, allowed are the integers 1 to 15");
+                          "parameters: \"iterations\" is 1e+30, expected an integer from 1 to 15");
     expectManifestRefused(
-        "\"tag\": 1", "\"tag\": -1", "block 1: \"tag\" is -1, allowed are the integers 0 to 4294967295");
+        "\"tag\": 1", "\"tag\": -1", "block 1: \"tag\" is -1, expected an integer from 0 to 4294967295");
     expectManifestRefused("\"tag\": 1", "\"tag\": 3", "has another size or tag of block 1 than csv");
     expectManifestRefused("\"block_size\": 40", "\"block_size\": 48", "has another size or tag of block 0 than csv");
     expectManifestRefused("\"block_sizes\": \\[\\s*40\\s*\\]",
                           "\"block_sizes\": [41]",
-                          "parameters: \"block_sizes\" is a list, allowed are lists of block sizes of 3GPP TS 36.212");
+                          "parameters: \"block_sizes\" is a list, expected a list of block sizes of 3GPP TS 36.212");
     expectManifestRefused("\"seed\": 1,", "", "parameters: lacks \"seed\"");
     expectManifestRefused("\"ebn0_db\": 1.0,", "", "parameters: lacks \"ebn0_db\"");
     expectManifestRefused("\"ebn0_db\": 1.0",
                           "\"ebn0_db\": 1.0001",
-                          "parameters: \"ebn0_db\" is 1.0001, allowed are -50 to 50 dB, with at most three decimals");
-    expectManifestRefused("\"width\": 8", "\"width\": 12", "parameters: \"width\" is 12, allowed are 8 and 16");
+                          "parameters: \"ebn0_db\" is 1.0001, expected -50 to 50 dB, with at most three decimals");
+    expectManifestRefused("\"width\": 8", "\"width\": 12", "parameters: \"width\" is 12, expected 8 or 16");
     expectManifestRefused(
-        "\"scaled\"", "\"best\"", "parameters: \"algorithm\" is \"best\", allowed are max-log, scaled, table");
+        "\"scaled\"", "\"best\"", "parameters: \"algorithm\" is \"best\", expected max-log, scaled or table");
     expectManifestRefused("\"name\": \"csv\"", "\"name\": \"xls\"", "format \"xls\" is not known");
     expectManifestRefused("ratios.csv", "../ratios.csv", "format csv lacks the file ratios.csv");
     expectManifestRefused("\"soft\": true", "\"soft\": false", "format csv lacks the file internal.csv");
@@ -304,13 +304,13 @@ TEST_F(VectorSet, RefusesToCompareLessThanTheManifestTells)
     expectChangedRefused([](auto& json) { json["formats"][1] = json["formats"][0]; },
                          manifest + "names the format csv twice");
     expectChangedRefused([](auto& json) { json["parameters"]["block_sizes"][0] = 48; },
-                         manifest + "names random block 0 of 40 bits, its parameters make it of 48");
+                         manifest + "names random block 0 of 40 bits, its parameters make it 48");
     expectChangedRefused([](auto& json) { json["parameters"]["blocks"] = 3; },
                          manifest + "names 2 random blocks, its parameters make 3");
     expectChangedRefused([](auto& json) { json["parameters"]["directed"] = true; },
                          manifest + "names no directed block, its parameters make some");
     expectChangedRefused([](auto& json) { json["formats"].erase(1); },
-                         path() + "/blocks.memh: is none of the files that manifest.json names, and cannot be checked");
+                         path() + "/blocks.memh: is not a file that manifest.json names, and cannot be checked");
     expectChangedRefused(
         [](auto& json) {
             json["parameters"]["internal"] = false;
@@ -319,7 +319,7 @@ TEST_F(VectorSet, RefusesToCompareLessThanTheManifestTells)
                 format["tables"].erase(4);
             }
         },
-        path() + "/internal.csv: is none of the files that manifest.json names, and cannot be checked");
+        path() + "/internal.csv: is not a file that manifest.json names, and cannot be checked");
 }
 
 TEST_F(VectorSet, RefusesRowsOfOtherBlocks)
