@@ -13,7 +13,6 @@ namespace morvik::validation {
 namespace {
 
 constexpr unsigned atOnce = ReceivedBlocks::atOnce;
-constexpr int scaledAlgorithm = 1;
 constexpr float fillerRatio = -1e4F;  // filler bits are known to be 0
 
 veltra_ip_morvik_v1_0_state* twoUnits()

@@ -14,6 +14,8 @@
 
 namespace morvik::validation {
 
+constexpr int scaledAlgorithm = 1;
+
 class LossDecoders {
 public:
     /// reference: floating point throughout

@@ -8,7 +8,7 @@ CONFIDENCE = 1.96  # standard deviations on either side, for a 95 % interval
 
 
 class Point(NamedTuple):
-    ebn0_db: float
+    db: float  # Eb/N0 or Es/N0
     blocks: int
     errors: int
 
@@ -50,7 +50,7 @@ def bracket(points, rate):
 
 def slope(left, right):
     """The slope of the rate's logarithm per dB; negative."""
-    return math.log(right.rate / left.rate) / (right.ebn0_db - left.ebn0_db)
+    return math.log(right.rate / left.rate) / (right.db - left.db)
 
 
 def interpolated(left_deviation, right_deviation, way):
@@ -65,7 +65,7 @@ def crossing(points, rate):
         return None
     left, right, way = found
     deviation = interpolated(left.log_deviation, right.log_deviation, way) / -slope(left, right)
-    return Estimate(left.ebn0_db + way * (right.ebn0_db - left.ebn0_db), deviation)
+    return Estimate(left.db + way * (right.db - left.db), deviation)
 
 
 def paired_step(before, after, disagreements, rate):
@@ -78,7 +78,7 @@ def paired_step(before, after, disagreements, rate):
     if first is None or second is None:
         return None
     left, right, way = bracket(after, rate)
-    deviations = [math.sqrt(disagreements[point.ebn0_db]) / point.errors for point in (left, right)]
+    deviations = [math.sqrt(disagreements[point.db]) / point.errors for point in (left, right)]
     return Estimate(second.db - first.db, interpolated(*deviations, way) / -slope(left, right))
 
 
@@ -88,15 +88,21 @@ def read_rows(path):
         return list(csv.DictReader(line for line in file if not line.startswith("#")))
 
 
+def db_of(row):
+    """The place of a row's point: Eb/N0, or Es/N0 where there is nothing else."""
+    return float(row["ebn0_db"] if "ebn0_db" in row else row["esn0_db"])
+
+
 def read_reference(path):
     """The curve of a file of validation/error_rates."""
-    return [Point(float(row["ebn0_db"]), int(row["frames"]), int(row["frame_errors"])) for row in read_rows(path)]
+    return [Point(db_of(row), int(row["frames"]), int(row["frame_errors"])) if "frames" in row else
+            Point(db_of(row), int(row["blocks"]), int(row["block_errors"])) for row in read_rows(path)]
 
 
 def read_curves(path, *keys):
     """The curves of a result file, keyed by the values of the columns in `keys`."""
     curves = {}
     for row in read_rows(path):
-        point = Point(float(row["ebn0_db"]), int(row["blocks"]), int(row["block_errors"]))
+        point = Point(db_of(row), int(row["blocks"]), int(row["block_errors"]))
         curves.setdefault(tuple(row[key] for key in keys), []).append(point)
     return curves

@@ -13,8 +13,9 @@ import unittest
 
 sys.dont_write_bytecode = True  # writes no bytecode into the tree
 from distances import Estimate, Point, crossing, paired_step, read_curves, read_reference
-from needed import ITERATIONS, SIMULATIONS, TYPES, needed, pictures
-from validate import DOCUMENT, RESULTS, with_tables
+import loss
+from needed import ITERATIONS, SIMULATIONS, TYPES, needed
+from validate import DOCUMENT, RESULTS, pictures, with_tables
 
 
 def curve(start, per_decade, blocks=1000000):
@@ -119,6 +120,20 @@ class Simulations(unittest.TestCase):
             self.assertEqual(set(found), {(40, algorithm, each) for algorithm in TYPES for each in ITERATIONS})
             self.assertTrue(all(1 < estimate.db < 5 for estimate in found.values()), found)
             self.assertEqual(header, (RESULTS / f"{name}.csv").read_text(encoding="utf-8").splitlines()[0])
+
+
+    def test_behind_the_chain_have_the_rate_for_all_decoders(self):
+        """The shortest form of `scripts/validate loss`."""
+        short = loss.Loss((loss.Format("0.50", "16qam", 16, 80),), loss.DECODERS, 20000)
+        with tempfile.TemporaryDirectory() as folder:
+            path = pathlib.Path(folder) / "loss.csv"
+            short.run(PROGRAMS, path)
+            ((needed_db, more, steps),) = loss.estimates(path).values()
+            header = path.read_text(encoding="utf-8").splitlines()[0]
+        self.assertTrue(5 < needed_db.db < 9, needed_db)
+        self.assertTrue(-0.2 < more < 0.5, more)
+        self.assertEqual(len(steps), 3)
+        self.assertEqual(header, (RESULTS / "loss.csv").read_text(encoding="utf-8").splitlines()[0])
 
 
 class Document(unittest.TestCase):

@@ -7,11 +7,13 @@
 #include <cstdio>
 #include <exception>
 #include <iostream>
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "LossDecoders.h"
 #include "ReceivedBlocks.h"
+#include "link/RatioScale.h"
 
 namespace {
 
@@ -22,7 +24,7 @@ struct Options {
     std::string modulation;
     std::string demapper = "max-log";
     unsigned iterations = 8;
-    float scale = 8;
+    std::optional<double> scale;  ///< that of `morvik ber`, if none
     std::vector<int> milliDecibels;
     std::uint64_t blockErrors = 300;
     std::uint64_t maxBlocks = 100000;
@@ -34,7 +36,10 @@ struct Options {
 void simulatePoint(const Options& options, int milliDecibels)
 {
     ReceivedBlocks blocks(options.chain, milliDecibels);
-    LossDecoders decoders(blocks.code(), options.decoders, options.scale, options.iterations);
+    const double codeRate = static_cast<double>(options.chain.bits) / options.chain.codedBits;
+    const double scale =
+        options.scale.value_or(morvik::link::ratioScale(scaledAlgorithm, options.chain.modulation, codeRate));
+    LossDecoders decoders(blocks.code(), options.decoders, static_cast<float>(scale), options.iterations);
     const std::size_t kinds = options.decoders.size();
     std::vector<std::uint64_t> errors(kinds);
     std::vector<std::uint64_t> disagreements(kinds);
@@ -53,12 +58,12 @@ void simulatePoint(const Options& options, int milliDecibels)
         }
     }
     for (std::size_t i = 0; i < kinds; ++i) {
-        std::printf("%s,%s,%u,%u,%g,%u,%.3f,%s,%llu,%llu,%llu\n",
+        std::printf("%s,%s,%u,%u,%.3f,%u,%.3f,%s,%llu,%llu,%llu\n",
                     options.modulation.c_str(),
                     options.demapper.c_str(),
                     options.chain.bits,
                     options.chain.codedBits,
-                    static_cast<double>(options.scale),
+                    scale,
                     options.iterations,
                     milliDecibels / 1000.0,
                     options.decoders[i].c_str(),
@@ -81,7 +86,8 @@ void addOptions(CLI::App& app, Options& options)
     app.add_option("--transport-block-size", options.chain.bits, "A, of one code block")->required();
     app.add_option("--coded-bits", options.chain.codedBits, "G")->required();
     app.add_option("--iterations", options.iterations, "Turbo iterations, 1 to 15")->check(CLI::Range(1, 15));
-    app.add_option("--scale", options.scale, "Steps of a soft value for a ratio of 1")->check(CLI::PositiveNumber);
+    app.add_option("--scale", options.scale, "Steps of a soft value for a ratio of 1; by default those of `morvik ber`")
+        ->check(CLI::PositiveNumber);
     app.add_option("--esn0-millidb", options.milliDecibels, "Es/N0 in thousandths of a decibel")
         ->delimiter(',')
         ->required();

@@ -40,15 +40,15 @@ def decibels(thousandths):
     return f"{thousandths / 1000:g}"
 
 
-def bracketed(start, step, rates):
+def bracketed(start, step, rates, rate=RATE):
     """The rows of neighbouring points between which all curves fall below the rate.
 
     `rates` simulates a point, in full or with few blocks, and returns its rows and the rates in them.
     """
     place = start - start % step
-    while max(rates(place, False)[1]) >= RATE:
+    while max(rates(place, False)[1]) >= rate:
         place += step
-    while min(rates(place - step, False)[1]) < RATE:
+    while min(rates(place - step, False)[1]) < rate:
         place -= step
     points = {}
 
@@ -59,10 +59,10 @@ def bracketed(start, step, rates):
         return points[point][1]
 
     last = place
-    while max(full(last)) >= RATE:
+    while max(full(last)) >= rate:
         last += step
     first = last - step
-    while min(full(first)) < RATE:
+    while min(full(first)) < rate:
         first -= step
     return [row for point in sorted(points) if first <= point <= last for row in points[point][0]], first
 

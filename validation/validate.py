@@ -16,7 +16,9 @@ import tempfile
 
 sys.dont_write_bytecode = True  # writes no bytecode into the tree
 from distances import crossing, paired_step, read_curves, read_reference, read_rows
-from needed import ITERATIONS, SIMULATIONS, division_table, needed_table, pictures
+import loss
+import needed
+from needed import ITERATIONS, division_table, needed_table
 from plot import draw
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
@@ -49,6 +51,7 @@ VARIANT_RUNS = {
          ["600,650,700,750", "400,450,500", "300,350,400,450"]))
     for algorithm, points in zip(("0", "1", "2"), by_algorithm)
 }
+SIMULATIONS = {**needed.SIMULATIONS, **loss.SIMULATIONS}
 ALL_RUNS = [*MODEL_RUNS, *VARIANT_RUNS, *SIMULATIONS]
 
 # Results, the reference with the same number of iterations, its name in the document, and the types compared with it.
@@ -60,6 +63,9 @@ COMPARISONS = (
     ("k6144_i6", "aff3ct_lte_k6144_i6_float32.csv", "scaled", TYPES),
     ("k6144_i6", "aff3ct_lte_k6144_i6_q16_6b3f.csv", "scaled, 6 bits", TYPES),
 )
+CHAIN_HEADER = ["A, G", "reference", "needs", "our reference", "2 units"]
+LOSS_HEADER = ["modulation", "code rate", "reference needs", "2 units", "8 bits", "formats", "segments and windows"]
+MCS_HEADER = ["table", "MCS", "modulation", "bits", "code rate", "reference needs", "2 units"]
 # References with the algorithm of the fine decoder, by simulation.
 LIKE_FINE = {
     "variants_k40_type1": "local_aff3ct302_k40_i8_maxlog075.csv",
@@ -164,11 +170,19 @@ def with_tables(text):
     by_iterations = ["K", "type", *map(str, sorted(ITERATIONS))]
     for name, content in (("references", reference_table()), ("distances", distance_table()), ("steps", step_table()),
                           ("units", table(by_iterations, needed_table(RESULTS), 2)),
-                          ("undivided", table(by_iterations, division_table(RESULTS), 2))):
+                          ("undivided", table(by_iterations, division_table(RESULTS), 2)),
+                          ("chain", table(CHAIN_HEADER, loss.chain_table(RESULTS, REFERENCES), 2)),
+                          ("loss", table(LOSS_HEADER, loss.loss_table(RESULTS), 1)),
+                          ("mcs", table(MCS_HEADER, loss.mcs_table(RESULTS), 3))):
         begin, end = f"<!-- {name} -->\n", f"<!-- end of {name} -->"
         before, rest = text.split(begin)
         text = before + begin + content + end + rest.split(end)[1]
     return text
+
+
+def pictures(results):
+    """Name and content of each plot but that of distances."""
+    return {**needed.pictures(results), "loss.svg": loss.draw_loss(results)}
 
 
 def main(arguments):

@@ -29,7 +29,7 @@ BELOW = {
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
     "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
-    "validation": "link/channel link/coding link/modulation link/random rules src",
+    "validation": "link link/channel link/coding link/modulation link/random rules src",
 }
 
 
