@@ -95,7 +95,7 @@ class decoder(_Chunks):
         num_pu=2,
         algorithm="scaled",
         iterations=8,
-        scale=lte.DEFAULT_SCALE,
+        scale=None,
     ):
         self._chain = lte.Transport(transport_block_size, coded_bits, modulation)
         self._decoder = morvik.Decoder(num_pu, algorithm)

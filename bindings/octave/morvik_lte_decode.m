@@ -12,7 +12,7 @@
 % code_blocks_fit         whether the CRC of each code block fits: logical, a row for each code block
 %
 % Options:
-%   'scale'    steps of a soft value for a ratio of 1 (default 4)
+%   'scale'    steps of a soft value for a ratio of 1; [] suits modulation, code rate and algorithm (default)
 %   'num_pu', 'algorithm', 'iterations'    as for morvik_decode
 %   'layers', 'soft_buffer_size'           as for morvik_lte_encode
 %
@@ -25,9 +25,14 @@ function [bits, fits, code_blocks_fit] = morvik_lte_decode(buffers, transport_bl
         error('morvik:badCall', '%s: needs soft buffers, two sizes and the modulation', caller);
     end
     [format, options] = morvik_lte_format(caller, transport_block_size, coded_bits, modulation, ...
-        struct('scale', 4, 'num_pu', 2, 'algorithm', 'scaled', 'iterations', 8), varargin);
+        struct('scale', [], 'num_pu', 2, 'algorithm', 'scaled', 'iterations', 8), varargin);
     rows = morvik_lte_call(caller, 'transport_buffer', format);
     buffers = morvik_lte_buffers(caller, buffers, rows, size(buffers, 2));
+    if isempty(options.scale)
+        algorithm = morvik_lte_choice(caller, 'algorithm', options.algorithm, {'max-log', 'scaled', 'table'}) - 1;
+        rate = transport_block_size / coded_bits;
+        options.scale = morvik_lte_call(caller, 'ratio_scale', algorithm, morvik_lte_modulation(caller, modulation), rate);
+    end
     scale = morvik_lte_positive(caller, 'scale', options.scale);
     blocks = morvik_lte_segment(transport_block_size);
     decisions = cell(1, blocks.count);

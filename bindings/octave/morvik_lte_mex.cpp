@@ -17,6 +17,7 @@
 #include <memory>
 #include <vector>
 
+#include "link/RatioScale.h"
 #include "morvik_link.h"
 
 namespace {
@@ -179,6 +180,16 @@ std::int32_t softValues(Results results, Arguments arguments)
                                    data<std::int8_t>(results[0]));
 }
 
+/// algorithm, bits per symbol, code rate -> scale
+std::int32_t ratioScale(Results results, Arguments arguments)
+{
+    const auto modulation = morvik::link::modulations[whole(arguments[1]) / 2];
+    const auto algorithm = static_cast<int>(whole(arguments[0]));
+    results[0] =
+        mxCreateDoubleScalar(morvik::link::ratioScale(algorithm, modulation, *data<const double>(arguments[2])));
+    return MORVIK_LINK_OK;
+}
+
 // ---- Modulation: a symbol is two rows, I and Q, or one for BPSK
 
 /// bits per symbol, bits -> symbols
@@ -338,13 +349,14 @@ struct Command {
     std::int32_t (*run)(Results results, Arguments arguments);
 };
 
-constexpr std::array<Command, 14> commands = {{{"crc", crc},
+constexpr std::array<Command, 15> commands = {{{"crc", crc},
                                                {"segment", segment},
                                                {"rate_match", rateMatch},
                                                {"rate_recover", rateRecover},
                                                {"buffer_size", bufferSize},
                                                {"deinterleave", deinterleave},
                                                {"soft_values", softValues},
+                                               {"ratio_scale", ratioScale},
                                                {"map", map},
                                                {"demap", demap},
                                                {"encode", encode},

@@ -54,6 +54,16 @@
 %! assert(fits, true(1, 3));
 %! assert(decided, bits);
 
+%!test  % the scale suits modulation, code rate and algorithm
+%! bits = rand(2000, 100) < 0.5;
+%! ratios = 3 * (2 * morvik_lte_encode(bits, 3000, '64qam') - 1) + 4.5 * randn(3000, 100);
+%! buffers = morvik_lte_recover(ratios, 2000, '64qam');
+%! decided = @(varargin) morvik_lte_decode(buffers, 2000, 3000, '64qam', varargin{:});
+%! assert(decided(), decided('scale', 2.3));
+%! assert(decided('algorithm', 'table'), decided('algorithm', 'table', 'scale', 4.5));
+%! assert(any(any(decided() ~= decided('scale', 4.5))));
+%! assert(any(any(decided() ~= bits)));
+
 %!test  % the steps of a code block
 %! rand('seed', 2);
 %! bits = [false(17, 4); rand(1007, 4) < 0.5];
@@ -72,7 +82,6 @@
 
 %!test  % how ratios are rounded
 %! assert(morvik_lte_soft_values([0.5 -0.5 0.49; 127 -9 999], 1), int8([1 -1 0; 127 -9 127]));
-%! assert(morvik_lte_soft_values([1 -1]), int8([4 -4]));
 
 %!test  % no block at all
 %! assert(size(morvik_lte_encode(zeros(8, 0), 80, 'qpsk')), [80, 0]);

@@ -12,6 +12,7 @@
 
 #include "Arrays.h"
 #include "Decoder.h"
+#include "link/RatioScale.h"
 #include "morvik_link.h"
 #include "rules/Tail.h"
 
@@ -400,6 +401,14 @@ void addLte(py::module_& module)
         "deinterleave_steps", deinterleave<std::int8_t>, arg("matching"), arg("buffers").noconvert(), arg("filler"));
     module.def("soft_values", softValues, arg("ratios").noconvert(), arg("scale"));
     module.def("soft_steps", softSteps, arg("ratios").noconvert(), arg("scale"), arg("width"));
+    module.def(
+        "ratio_scale",
+        [](int algorithm, std::uint32_t bitsPerSymbol, double codeRate) {
+            return link::ratioScale(algorithm, link::modulations[bitsPerSymbol / 2], codeRate);
+        },
+        arg("algorithm"),
+        arg("bits_per_symbol"),
+        arg("code_rate"));
     module.def("map", map, arg("bits_per_symbol"), arg("bits").noconvert());
     module.def("demap",
                demap,

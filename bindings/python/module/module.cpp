@@ -1,6 +1,5 @@
 // module: the extension `morvik._core`, the base of the package `morvik`. It relies on the package's checks of numbers
 // and shapes.
-#include <pybind11/functional.h>
 #include <pybind11/numpy.h>
 #include <pybind11/pybind11.h>
 #include <pybind11/stl.h>
@@ -11,11 +10,9 @@
 
 #include "Arrays.h"
 #include "Decoder.h"
-#include "ErrorRates.h"
 #include "Link.h"
 #include "Lte.h"
-#include "base/Error.h"
-#include "base/Thousandths.h"
+#include "Simulation.h"
 #include "rules/Tail.h"
 #include "src/InstructionSetNames.h"
 
@@ -105,118 +102,7 @@ void addDecoder(py::module_& module)
     decoder.def_property_readonly("instruction_set", py::cpp_function(&Decoder::instructionSet, unlocked));
 }
 
-// ---- Simulation
-
-/// Named like the columns of result files.
-py::dict fields(const morvik::simulation::ResultRow& row)
-{
-    const morvik::simulation::Bounds bits = morvik::simulation::bitErrorBounds(row);
-    const morvik::simulation::Bounds blocks = morvik::simulation::blockErrorBounds(row);
-    py::dict fields;
-    fields["point"] = row.pointNumber;
-    fields["block_size"] = row.point.blockSize;
-    fields["num_pu"] = row.point.numPu;
-    fields["algorithm"] = morvik::simulation::algorithmName(row.point.algorithm);
-    fields["scale_option"] = morvik::simulation::scaleOptionText(row.point.scaleOption);
-    fields["iterations"] = row.point.iterations;
-    fields["ebn0_db"] = morvik::base::fromThousandths(row.point.milliDecibels);
-    fields["scale"] = morvik::base::fromThousandths(row.point.milliScale);
-    fields["frames"] = row.frames.text();
-    fields["blocks"] = row.frames.size();
-    fields["bit_errors"] = row.errors.bitErrors;
-    fields["block_errors"] = row.errors.blockErrors;
-    fields["bit_error_squares"] = row.errors.bitErrorSquares;
-    fields["ber"] = morvik::simulation::bitErrorRate(row);
-    fields["ber_low"] = bits.low;
-    fields["ber_high"] = bits.high;
-    fields["bler"] = morvik::simulation::blockErrorRate(row);
-    fields["bler_low"] = blocks.low;
-    fields["bler_high"] = blocks.high;
-    fields["clipped_values"] = row.clipped;
-    fields["clipped_fraction"] = morvik::simulation::clippedFraction(row);
-    fields["failed_frames"] = py::tuple(py::cast(row.errors.failures));
-    fields["seconds"] = row.seconds;
-    fields["seed"] = row.seed;
-    fields["version"] = row.version;
-    return fields;
-}
-
-py::list fieldsOf(const std::vector<morvik::simulation::ResultRow>& rows)
-{
-    py::list list;
-    for (const morvik::simulation::ResultRow& row : rows) {
-        list.append(fields(row));
-    }
-    return list;
-}
-
-/// Ctrl-C and Python's other signals end a simulation through their exceptions.
-Listeners listenersOf(const py::object& progress)
-{
-    Listeners listeners;
-    listeners.isRunning = [] {
-        const py::gil_scoped_acquire locked;
-        if (PyErr_CheckSignals() != 0) {
-            throw py::error_already_set();
-        }
-    };
-    listeners.hasEnded = [&progress](const std::vector<morvik::simulation::ResultRow>& rows) {
-        const py::gil_scoped_acquire locked;
-        progress(fieldsOf(rows));
-    };
-    return listeners;
-}
-
-py::list simulate(const morvik::simulation::Sweep& sweep,
-                  const morvik::simulation::StopRules& rules,
-                  bool eachIteration,
-                  std::uint64_t seed,
-                  unsigned threads,
-                  const std::string& instructionSet,
-                  const py::object& progress)
-{
-    morvik::simulation::Plan plan;
-    plan.points = morvik::simulation::pointsOf(sweep);
-    plan.eachIteration = eachIteration;
-    plan.rules = rules;
-    plan.seed = seed;
-    plan.version = MORVIK_VERSION;
-    const Listeners listeners = listenersOf(progress);
-    std::vector<morvik::simulation::ResultRow> rows;
-    {
-        const Unlocked unlocked;
-        rows = errorRates(plan, threads, instructionSet, listeners);
-    }
-    return fieldsOf(rows);
-}
-
-void addSimulation(py::module_& module)
-{
-    py::class_<morvik::simulation::Sweep>(module, "Sweep")
-        .def(py::init<>())
-        .def_readwrite("block_sizes", &morvik::simulation::Sweep::blockSizes)
-        .def_readwrite("num_pus", &morvik::simulation::Sweep::numPus)
-        .def_readwrite("algorithms", &morvik::simulation::Sweep::algorithms)
-        .def_readwrite("milli_scales", &morvik::simulation::Sweep::scaleOptions)
-        .def_readwrite("iterations", &morvik::simulation::Sweep::iterations)
-        .def_readwrite("milli_decibels", &morvik::simulation::Sweep::milliDecibels);
-    py::class_<morvik::simulation::StopRules>(module, "StopRules")
-        .def(py::init<>())
-        .def_readwrite("block_errors", &morvik::simulation::StopRules::blockErrors)
-        .def_readwrite("bit_errors", &morvik::simulation::StopRules::bitErrors)
-        .def_readwrite("max_blocks", &morvik::simulation::StopRules::maxBlocks)
-        .def_readwrite("max_seconds", &morvik::simulation::StopRules::maxSeconds)
-        .def_readwrite("stop_bler", &morvik::simulation::StopRules::stopBler);
-    module.def("error_rate",
-               simulate,
-               py::arg("sweep"),
-               py::arg("rules"),
-               py::arg("each_iteration"),
-               py::arg("seed"),
-               py::arg("threads"),
-               py::arg("instruction_set"),
-               py::arg("progress"));
-}
+// ---- The module
 
 /// Whether the interpreter is the main one of the process; if not, an ImportError is set. In another one, pybind11
 /// would wait for the lock that its own thread holds.

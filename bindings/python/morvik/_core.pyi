@@ -69,6 +69,7 @@ def deinterleave_steps(
 ) -> list[npt.NDArray[Any]]: ...
 def soft_values(ratios: npt.NDArray[np.float32], scale: float) -> npt.NDArray[np.int8]: ...
 def soft_steps(ratios: npt.NDArray[np.float32], scale: float, width: int) -> npt.NDArray[np.int16]: ...
+def ratio_scale(algorithm: int, bits_per_symbol: int, code_rate: float) -> float: ...
 def map(bits_per_symbol: int, bits: npt.NDArray[np.uint8]) -> npt.NDArray[np.float32]: ...
 def demap(
     bits_per_symbol: int,
@@ -109,6 +110,21 @@ class Sweep:
     milli_scales: list[int | None]
     iterations: list[int]
     milli_decibels: list[int]
+    is_over_esn0: bool
+
+class LinkOptions:
+    def __init__(self) -> None: ...
+    transport_block_sizes: list[int]
+    coded_bits: list[int]
+    code_rates: list[int]
+    mcs_indices: list[int]
+    resource_blocks: int | None
+    resource_elements: int | None
+    versions: list[int]
+    soft_buffer_bits: int | None
+    soft_buffer_size: int | None
+    stops_early: bool | None
+    def set_names(self, modulations: list[str], channel: str, demapper: str, mcs_table: str) -> None: ...
 
 class StopRules:
     def __init__(self) -> None: ...
@@ -120,7 +136,9 @@ class StopRules:
 
 def error_rate(
     sweep: Sweep,
+    link: LinkOptions,
     rules: StopRules,
+    frames: tuple[int, int] | None,
     each_iteration: bool,
     seed: int,
     threads: int,

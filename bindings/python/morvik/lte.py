@@ -28,6 +28,7 @@ import numpy.typing as npt
 from morvik import _core
 from morvik._arguments import (
     DEFAULT_ITERATIONS,
+    algorithm_number,
     block_size as checked_block_size,
     expect_block,
     expect_unmasked,
@@ -40,7 +41,6 @@ from morvik._errors import Error
 from morvik._link import Streams, bits_of, three_streams
 
 __all__ = [
-    "DEFAULT_SCALE",
     "CodeBlock",
     "CodeBlocks",
     "Received",
@@ -52,13 +52,10 @@ __all__ = [
     "map",
     "rate_match",
     "rate_recover",
+    "scale_of",
     "segment",
     "soft_values",
 ]
-
-DEFAULT_SCALE = 4.0
-"""Steps of a soft value for a log-likelihood ratio of 1, which are those of the correction table. With scaled extrinsic
-values, no other scale is better by more than 0.03 dB, at any modulation and code rate."""
 
 _BITS_PER_SYMBOL = {"bpsk": 1, "qpsk": 2, "16qam": 4, "64qam": 6, "256qam": 8}
 _DEMAPPERS = ("max-log", "exact")
@@ -240,13 +237,26 @@ def deinterleave(
     return Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams))
 
 
-def soft_values(llrs: npt.ArrayLike, scale: float = DEFAULT_SCALE, width: int = 8) -> npt.NDArray[Any]:
+def scale_of(modulation: str, code_rate: float, *, algorithm: str | int = "scaled") -> float:
+    """The scale of :func:`soft_values` that suits a modulation and a code rate, as measured (docs/scale.md). It is that of
+    :func:`morvik.error_rate`.
+
+    ``code_rate``
+        Bits of a transport block for each coded bit that was sent, in all transmissions: above 0.
+    ``algorithm``
+        The decoder's algorithm.
+    """
+    number = integer("algorithm", algorithm_number(algorithm), 0, 2)
+    return _core.ratio_scale(number, bits_per_symbol(modulation), _positive("code_rate", code_rate))
+
+
+def soft_values(llrs: npt.ArrayLike, scale: float, width: int = 8) -> npt.NDArray[Any]:
     """Turns log-likelihood ratios into soft values: scaled, rounded with halves away from 0, and clipped.
 
     ``llrs``
         Of any shape, finite.
     ``scale``
-        Steps for a ratio of 1.
+        Steps for a ratio of 1, such as :func:`scale_of` tells.
     ``width``
         Bits of a soft value. 8 gives int8, what :meth:`morvik.Decoder.decode` takes; other widths, 2 to 16, give int16,
         for soft buffers of this width.
@@ -406,13 +416,17 @@ class Transport:
             self._core.recover_steps(_version(version), received, _width(width), sums)
         return sums.reshape(*array.shape[:-1], -1)
 
-    def soft_values(self, buffers: npt.ArrayLike, scale: float | None = None) -> list[Streams]:
+    def soft_values(
+        self, buffers: npt.ArrayLike, scale: float | None = None, *, algorithm: str | int = "scaled"
+    ) -> list[Streams]:
         """The soft values of each code block, for :meth:`morvik.Decoder.decode`: int8 of shape (K + 4,) or (n, K + 4).
 
         ``buffers``
             What :meth:`recover` returns. Those of whole steps are only clipped.
         ``scale``
-            Steps for a ratio of 1; :data:`DEFAULT_SCALE` when None.
+            Steps for a ratio of 1; None is :func:`scale_of` one transmission and the algorithm.
+        ``algorithm``
+            The decoder's algorithm.
         """
         array = plain_array("buffers", buffers)
         is_steps = array.dtype == np.int16
@@ -422,7 +436,9 @@ class Transport:
             array = _ratios(array, "buffers")
         self._expect_columns("buffers", array, self._core.buffer_size)
         rows = _rows(array)
-        steps = DEFAULT_SCALE if scale is None else _positive("scale", scale)
+        if scale is None:
+            scale = scale_of(self._modulation, self._size / self._coded_bits, algorithm=algorithm)
+        steps = _positive("scale", scale)
         blocks = (
             self._core.soft_values_of_steps(r, rows) if is_steps else self._core.soft_values(r, rows, steps)
             for r in range(self._code_blocks.number)
@@ -459,7 +475,7 @@ class Transport:
     ) -> Received:
         """Decodes soft buffers: :meth:`soft_values`, the decoder for all code blocks of one size at once, and
         :meth:`join`."""
-        blocks = self.soft_values(buffers, scale)
+        blocks = self.soft_values(buffers, scale, algorithm=decoder.algorithm)
         shape = blocks[0].sys.shape[:-1]
         decisions: list[npt.NDArray[np.uint8]] = []
         sizes = (self._code_blocks.size_minus, self._code_blocks.size_plus)

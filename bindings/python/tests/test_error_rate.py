@@ -1,6 +1,7 @@
 """Simulated error rates."""
 
 import csv
+import json
 import os
 import signal
 import threading
@@ -27,8 +28,8 @@ def expect_file(rates, file):
     for row, rate in zip(rows, rates):
         for name, text in row.items():
             value = rate[name]
-            if name == "failed_frames":
-                assert [int(frame) for frame in text.split()] == list(value)
+            if name in ("failed_frames", "redundancy_versions"):
+                assert [int(number) for number in text.split()] == list(value)
             elif isinstance(value, str):
                 assert value == text
             elif name != "seconds":
@@ -54,6 +55,57 @@ def test_scales_are_those_of_the_command(repository):
         bit_errors=10000,
     )
     expect_file(rates, repository / "tests/data/ber/scales.csv")
+
+
+def test_transport_blocks_are_those_of_the_command(repository):
+    rates = morvik.error_rate(
+        transport_block_size=[120, 7000],
+        code_rate=[0.6, 0.12],
+        modulation=["qpsk", "256qam"],
+        redundancy_versions=[0, 2, 3, 1],
+        channel="rayleigh",
+        early_stop="crc",
+        esn0_db=[-3, 5, 16],
+        iterations=4,
+        max_blocks=20,
+        seed=7,
+    )
+    expect_file(rates, repository / "tests/data/ber/link.csv")
+
+
+def test_modulated_blocks_are_those_of_the_command(repository):
+    rates = morvik.error_rate(
+        [104, 512], [4, 12], modulation=["bpsk", "64qam"], channel="block-rayleigh", iterations=3, max_blocks=70
+    )
+    expect_file(rates, repository / "tests/data/ber/modulated.csv")
+
+
+def test_schemes_and_frames_are_those_of_the_command(repository):
+    rates = morvik.error_rate(
+        mcs=[27, 5],
+        mcs_table="256qam",
+        resource_blocks=4,
+        demapper="exact",
+        soft_buffer_bits=7,
+        soft_buffer_size=9000,
+        esn0_db=[3, 26],
+        algorithm="table",
+        iterations=3,
+        each_iteration=True,
+        frames=(4294967290, 4294967310),
+    )
+    kept = (repository / "tests/data/ber/link.json").read_text().replace('"seconds": T', '"seconds": 0')
+    rows = json.loads(kept)["rows"]
+    assert [list(row) for row in rows] == [list(rates.dtype.names)] * len(rates)
+    for row, rate in zip(rows, rates):
+        for name in ("mcs", "esn0_db", "frames", "iterations", "bit_errors", "block_errors", "demapper", "throughput"):
+            assert rate[name] == pytest.approx(row[name], rel=1e-5) if name == "throughput" else rate[name] == row[name]
+    expect_file(
+        morvik.error_rate(
+            [104, 2048], [0, 0.4, 0.8], num_pu=4, iterations=8, each_iteration=True, frames=(4294967290, 4294967390)
+        ),
+        repository / "tests/data/ber/each_iteration.csv",
+    )
 
 
 def test_each_iteration_is_counted():
@@ -175,6 +227,16 @@ def test_nothing_is_printed(capfd):
         ({"threads": 0}, ValueError, "threads must be in the range 1 to 1024"),
         ({"instruction_set": "mmx"}, morvik.Error, "Instruction set 'mmx' is not one of"),
         ({"progress": 3}, TypeError, "progress must be callable, not 3"),
+        ({"block_size": None}, ValueError, "one of block_size, transport_block_size and mcs must be given"),
+        ({"ebn0_db": 1, "esn0_db": 1}, ValueError, "only one of them can be given"),
+        ({"mcs": 3, "resource_blocks": 6}, morvik.Error, "block_size sends plain code blocks, mcs transport blocks"),
+        ({"early_stop": "crc"}, morvik.Error, "early_stop crc needs transport blocks, by transport_block_size or mcs"),
+        ({"block_size": None, "transport_block_size": 40}, morvik.Error, "needs either coded_bits or code_rate"),
+        ({"modulation": "8psk"}, ValueError, "modulation must be one of bpsk, qpsk, 16qam, 64qam, 256qam, not '8psk'"),
+        ({"channel": 3}, ValueError, "channel must be one of awgn, rayleigh, block-rayleigh, not 3"),
+        ({"redundancy_versions": []}, ValueError, "redundancy_versions must be 1 to 16 numbers, not 0"),
+        ({"frames": (3, 3)}, ValueError, "frames must be .FROM, TO., with FROM below TO, not .3, 3."),
+        ({"each_iteration": True, "redundancy_versions": [0, 2]}, ValueError, "counts one transmission"),
     ],
 )
 def test_refuses(arguments, kind, text):

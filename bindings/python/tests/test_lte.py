@@ -150,10 +150,24 @@ def test_ratios_are_those_of_all_points(modulation, demapper):
 
 def test_soft_values_are_rounded_and_clipped():
     llrs = [[0.0, 0.0625, -0.0625, 0.06], [15.9, 16.0, -16.0, -99.0]]
-    assert lte.soft_values([1.0]).tolist() == [4]
     assert lte.soft_values(llrs, 8).tolist() == [[0, 1, -1, 0], [127, 127, -128, -128]]
     wide = lte.soft_values(llrs, 2, width=6)
     assert wide.dtype == np.int16 and wide.tolist() == [[0, 0, 0, 0], [31, 31, -32, -32]]
+
+
+def test_the_scale_is_that_of_error_rates():
+    chain = lte.Transport(2024, 3056, "256qam")
+    for algorithm in ("scaled", "table"):
+        (rate,) = morvik.error_rate(
+            transport_block_size=2024, coded_bits=3056, modulation="256qam", esn0_db=19, algorithm=algorithm, max_blocks=1
+        )
+        scale = lte.scale_of("256qam", 2024 / 3056, algorithm=algorithm)
+        assert scale == pytest.approx(rate.scale, abs=0.001)
+        llrs = np.random.default_rng(1).normal(0, 20, 3056)
+        buffers = chain.recover(llrs)
+        assert np.array_equal(
+            chain.soft_values(buffers, algorithm=algorithm)[0].par2, chain.soft_values(buffers, scale)[0].par2
+        )
 
 
 CHAIN = lte.Transport(1000, 2400)
@@ -188,9 +202,10 @@ LLRS = np.ones(2400)
         (lambda: lte.rate_recover(LLRS, 40, fillers=40), ValueError, "fillers must be in the range 0 to 39"),
         (lambda: lte.rate_recover(LLRS, 40, buffer_size=1), morvik.Error, "soft buffer.*buffer_size=1"),
         (lambda: lte.deinterleave(LLRS, 40), ValueError, "buffers must have 132 values for each block, not 2400"),
-        (lambda: lte.soft_values(1.0), ValueError, "llrs must be an array, not a number"),
-        (lambda: lte.soft_values([1j]), TypeError, "llrs must hold real numbers, not complex128"),
-        (lambda: lte.soft_values([1.0], width=17), ValueError, "width must be in the range 2 to 16"),
+        (lambda: lte.soft_values(1.0, 4), ValueError, "llrs must be an array, not a number"),
+        (lambda: lte.soft_values([1j], 4), TypeError, "llrs must hold real numbers, not complex128"),
+        (lambda: lte.soft_values([1.0], 4, width=17), ValueError, "width must be in the range 2 to 16"),
+        (lambda: lte.scale_of("qpsk", 0), ValueError, "code_rate must be a positive number"),
         (lambda: lte.map([0, 1, 1]), ValueError, "bits must be a multiple of the 2 of a qpsk symbol, not 3"),
         (lambda: lte.demap([1j], "bpsk", 1), TypeError, "symbols must be an array of real numbers"),
         (lambda: lte.demap([1j], "qpsk", 0), ValueError, "noise_variance must be a positive number"),
