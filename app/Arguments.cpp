@@ -40,25 +40,31 @@ CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max)
     return CLI::Validator(check, "");
 }
 
+std::string alternatives(const std::vector<std::string>& words)
+{
+    std::string text;
+    for (const std::string& word : words) {
+        text += (text.empty() ? "" : &word == &words.back() ? " or " : ", ") + word;
+    }
+    return text;
+}
+
 CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& choices)
 {
-    const auto check = [choices](std::string& text) -> std::string {
-        std::string allowed;
-        for (const auto& [choice, value] : choices) {
-            if (text == choice) {
-                text = value;
-                return {};
-            }
-            const bool isLast = choice == choices.back().first;
-            allowed += (allowed.empty() ? "" : isLast ? " or " : ", ") + choice;
-        }
-        return base::shown(text) + " is not allowed, expected " + allowed;
-    };
     std::vector<std::string> words;
     words.reserve(choices.size());
     for (const auto& [choice, value] : choices) {
         words.push_back(choice);
     }
+    const auto check = [choices, expected = alternatives(words)](std::string& text) -> std::string {
+        for (const auto& [choice, value] : choices) {
+            if (text == choice) {
+                text = value;
+                return {};
+            }
+        }
+        return base::shown(text) + " is not allowed, expected " + expected;
+    };
     return CLI::Validator(check, "", wordsAsName(words));
 }
 

@@ -15,6 +15,9 @@ namespace morvik {
 /// Rewrites the text in its shortest form, because the argument parser would read a leading zero as octal.
 CLI::Validator integerFrom(std::uint32_t min, std::uint32_t max);
 
+/// "2, 4 or 8".
+std::string alternatives(const std::vector<std::string>& words);
+
 /// Accepts the first text of each pair and replaces it by the second. For CLI::Option::transform.
 CLI::Validator oneOf(const std::vector<std::pair<std::string, std::string>>& choices);
 

@@ -98,11 +98,7 @@ void addChoice(CLI::App& command,
     const auto take = [=, &value](const std::string& text) {
         const auto found = std::find(words.begin(), words.end(), text);
         if (found == words.end()) {
-            std::string allowed = "expected";
-            for (const std::string& word : words) {
-                allowed += (word == words.front() ? " " : word == words.back() ? " or " : ", ") + word;
-            }
-            refuse(name, text, allowed);
+            refuse(name, text, "expected " + alternatives(words));
         }
         value = *(std::begin(values) + (found - words.begin()));
     };

@@ -204,7 +204,7 @@ and has one row for each of the K + 4 positions of a block. A new number in the 
 column starts a new block. Each block becomes a line of zeros and ones. The core keeps the low
 24 bits of a soft value, then clips it to -128 ... 127.
 
-With --transport-block-size, FILE opens with the line
+With --transport-block-size, FILE starts with the line
 block,soft_values
 and has one row for each transmission of a transport block: its number, then a value for each
 of the G coded bits; the second row of the same number has the second redundancy version.

@@ -23,9 +23,9 @@ protected:
     void expectNotAllowed(const std::string& option, const std::string& value, const std::string& allowed) const
     {
         const Arguments others = option == "--transport-block-size" ? Arguments{} : words("--transport-block-size 40");
-        expectRefused(Arguments{"ber", option, value} + others,
-                      "morvik ber: " + option + ": \"" + value + "\" is not allowed, " + allowed +
-                          "; 'morvik ber --help' tells what is allowed");
+        expectRefused(
+            Arguments{"ber", option, value} + others,
+            "morvik ber: " + option + ": \"" + value + "\" is not allowed, " + allowed + "; see 'morvik ber --help'");
     }
 
     /// Merges files into another.
@@ -256,8 +256,7 @@ TEST_F(BerLink, RefusesOptionsThatContradictEachOther)
                 "--each-iteration counts one transmission, --redundancy-versions 0,1 are 2");
     expectError("--transport-block-size 40 --coded-bits 120 --each-iteration --early-stop crc",
                 "--each-iteration counts after every iteration, --early-stop crc keeps one: give one of them");
-    expectError("--block-size 40 --ebn0 1 --esn0 1",
-                "--ebn0 excludes --esn0; 'morvik ber --help' tells what is allowed");
+    expectError("--block-size 40 --ebn0 1 --esn0 1", "--ebn0 excludes --esn0; see 'morvik ber --help'");
 }
 
 TEST_F(BerLink, RefusesValues)

@@ -239,7 +239,7 @@ TEST_F(TransportBlocksTest, OfWrongFormAreRefused)
     expectText("", "in.csv:1: no header, expected \"block,soft_values\"\n");
     expectText(morvik::support::header + '\n', "in.csv:1: wrong header");
     expectText(top, "in.csv:1: no rows after the header");
-    expectText(top + "x" + zeros, "in.csv:2: block \"x\" is no label");
+    expectText(top + "x" + zeros, "in.csv:2: block \"x\" is not a label");
     expectText(top + "0,1,2\n", "in.csv:2: 2 values, expected the 1600 of --coded-bits\n");
     for (const char* const value : {"nan", "inf", "-inf", "1e99", "", "1x"}) {
         expectText(top + "0,1," + value + zeros.substr(4),
