@@ -64,11 +64,13 @@ void BlockSimulator::simulate(std::uint64_t first, std::uint32_t count, BatchRes
 std::vector<ReceivedBlock> BlockSimulator::receivedBlocks() const
 {
     ReceivedBlock block;
+    const auto K = static_cast<std::ptrdiff_t>(itsPoint.blockSize);
+    const auto length = static_cast<std::ptrdiff_t>(itsPoint.blockSize + rules::tailPositions);
     for (unsigned s = 0; s < 3; ++s) {
         const auto first = itsFrames.streams[s].begin();
-        block.streams[s].assign(first, first + itsPoint.blockSize + rules::tailPositions);
+        block.streams[s].assign(first, first + length);
     }
-    block.sent.assign(itsFrames.sent.begin(), itsFrames.sent.begin() + itsPoint.blockSize);
+    block.sent.assign(itsFrames.sent.begin(), itsFrames.sent.begin() + K);
     return {block};
 }
 

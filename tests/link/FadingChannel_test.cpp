@@ -118,7 +118,9 @@ TEST_P(EveryFadingChannel, IsTheOneThatHasBeenPromisedHoweverItIsCut)
             digest = digestOf(all.gains, digestOf(all.symbols, digest));
             const Received part = received(channel, dimensions, 0xFFFFFFFFFF, 2, 500, 4032);
             EXPECT_EQ(part.gains, std::vector<float>(all.gains.begin() + 4032, all.gains.begin() + 4532));
-            EXPECT_TRUE(std::equal(part.symbols.begin(), part.symbols.end(), all.symbols.begin() + 4032 * dimensions));
+            EXPECT_TRUE(std::equal(part.symbols.begin(),
+                                   part.symbols.end(),
+                                   all.symbols.begin() + static_cast<std::ptrdiff_t>(4032 * dimensions)));
         }
     }
     EXPECT_EQ(digest, 0xD21C33AF01B432DFU) << std::hex << digest;

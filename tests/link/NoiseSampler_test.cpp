@@ -70,7 +70,7 @@ TEST_P(EveryNoiseSampler, NumbersAreThoseOfTheDefinition)
     }
     for (const std::uint32_t count : {0U, 1U, 7U, 8U, 63U, 65U, 4097U}) {
         EXPECT_EQ(numbersOf(sampler, random, count),
-                  std::vector<std::int16_t>(numbers.begin(), numbers.begin() + count));
+                  std::vector<std::int16_t>(numbers.begin(), numbers.begin() + static_cast<std::ptrdiff_t>(count)));
     }
     std::vector<std::int16_t> part(100);
     sampler.draw(random, 4008, 100, part.data());

@@ -59,7 +59,7 @@ std::vector<std::int8_t> valuesOf(const Batches& batches, unsigned frame, unsign
         for (std::size_t i = 0; i < batch.places.size(); ++i) {
             if (batch.places[i].frame == frame) {
                 const auto first = batch.streams[stream].begin() + static_cast<std::ptrdiff_t>(i * (batch.K + 4));
-                values.insert(values.end(), first, first + batch.K + 4);
+                values.insert(values.end(), first, first + static_cast<std::ptrdiff_t>(batch.K + 4));
             }
         }
     }

@@ -100,7 +100,7 @@ private:
         Streams streams;
         for (unsigned s = 0; s < 3; ++s) {
             const auto first = batch.streams[s].begin() + static_cast<std::ptrdiff_t>(i * (batch.K + 4));
-            streams[s].assign(first, first + batch.K + 4);
+            streams[s].assign(first, first + static_cast<std::ptrdiff_t>(batch.K + 4));
         }
         const unsigned r = batch.places[i].block;
         const link::CodeBlocks& blocks = itsSource.code().blocks();
