@@ -87,7 +87,7 @@ void ModulatedSource::receive(std::uint64_t frame, unsigned i, std::size_t place
         const float* const ratios = &itsRatios[s * positions];
         std::int8_t* const values = &frames.streams[s][place * positions];
         softValues(ratios, positions, itsScale, values);
-        frames.clipped[place] += clippedIn(ratios, positions, itsScale, values);
+        frames.clipped[place] += clippedIn(ratios, positions, itsScale);
     }
 }
 

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "link/kernels/RowKernels.h"
 #include "link/modulation/Mapper.h"
 
 namespace morvik::link {
@@ -20,23 +21,9 @@ std::uint64_t keyWordOf(const SymbolFormat& format)
     return kind << 32 | static_cast<std::uint32_t>(format.milliDecibels);
 }
 
-std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale, const std::int8_t* values)
+std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale)
 {
-    // Only values at the ends can be, and most runs of values have none.
-    constexpr std::size_t part = 64;
-    std::uint32_t clipped = 0;
-    for (std::size_t first = 0; first < count; first += part) {
-        const std::size_t end = std::min(first + part, count);
-        std::uint8_t atEnds = 0;
-        for (std::size_t i = first; i < end; ++i) {
-            atEnds = static_cast<std::uint8_t>(atEnds | (values[i] == 127) | (values[i] == -128));
-        }
-        for (std::size_t i = first; atEnds != 0 && i < end; ++i) {
-            const float steps = ratios[i] * scale;
-            clipped += steps >= 127.5F || steps <= -128.5F ? 1U : 0U;
-        }
-    }
-    return clipped;
+    return rowKernels().countOutside(ratios, count, scale, -128.5F, 127.5F);
 }
 
 SymbolLink::SymbolLink(const SymbolFormat& format, const RandomKey& key, const SamplerForm& form)

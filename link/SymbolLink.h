@@ -24,7 +24,7 @@ struct SymbolFormat {
 std::uint64_t keyWordOf(const SymbolFormat& format);
 
 /// How many soft values were clipped: those of ratios that, times scale, lie outside their range.
-std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale, const std::int8_t* values);
+std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale);
 
 class SymbolLink {
 public:

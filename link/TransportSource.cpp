@@ -66,8 +66,10 @@ void TransportSource::begin(std::uint64_t first, unsigned count)
         drawBits(itsRandomBits, FrameRandom(itsKey, 0, first + i), itsSetting.bits, itsInformation.block(i));
     }
     itsCode.encode(itsInformation, count, itsBuffers);
-    itsSoftBuffers.assign(itsSetting.softBufferBits == 0 ? count * itsCode.softSize() : 0, 0);
-    itsStepBuffers.assign(itsSetting.softBufferBits == 0 ? 0 : count * itsCode.softSize(), 0);
+    // One buffer serves all frames where nothing is sent again.
+    const std::size_t buffers = itsSetting.versions.size() > 1 ? count : 1;
+    itsSoftBuffers.resize(itsSetting.softBufferBits == 0 ? buffers * itsCode.softSize() : 0);
+    itsStepBuffers.resize(itsSetting.softBufferBits == 0 ? 0 : buffers * itsCode.softSize());
 }
 
 void TransportSource::transmit(const std::vector<unsigned>& frames,
@@ -100,15 +102,26 @@ void TransportSource::receive(unsigned frame, unsigned transmission)
     itsLink.receive(itsFirst + frame, transmission, itsCoded.data(), itsSetting.codedBits, itsRatios.data());
 }
 
+/// The soft buffer of a frame, empty before its first transmission.
+template <class Value>
+Value* TransportSource::bufferOf(std::vector<Value>& buffers, unsigned frame, unsigned transmission) const
+{
+    Value* const buffer = &buffers[(itsSetting.versions.size() > 1 ? frame : 0) * itsCode.softSize()];
+    if (transmission == 0) {
+        std::fill_n(buffer, itsCode.softSize(), Value{});
+    }
+    return buffer;
+}
+
 /// Adds a transmission to the soft buffer of a frame and rounds what it holds. Returns the number of clipped values.
 std::uint32_t TransportSource::recover(unsigned frame, unsigned transmission)
 {
     receive(frame, transmission);
-    float* const buffer = &itsSoftBuffers[frame * itsCode.softSize()];
+    float* const buffer = bufferOf(itsSoftBuffers, frame, transmission);
     itsCode.recover(itsRatios.data(), itsSetting.versions[transmission], buffer);
     const auto scale = static_cast<float>(itsSetting.scales[transmission]);
     softValues(buffer, itsCode.softSize(), scale, itsValues.data());
-    return clippedIn(buffer, itsCode.softSize(), scale, itsValues.data());
+    return clippedIn(buffer, itsCode.softSize(), scale);
 }
 
 /// The same with a soft buffer of few bits. What it holds at an end of its range counts as clipped.
@@ -121,7 +134,7 @@ std::uint32_t TransportSource::recoverSteps(unsigned frame, unsigned transmissio
                static_cast<float>(itsSetting.scales[transmission]),
                width,
                itsSteps.data());
-    std::int16_t* const buffer = &itsStepBuffers[frame * itsCode.softSize()];
+    std::int16_t* const buffer = bufferOf(itsStepBuffers, frame, transmission);
     itsCode.recover(itsSteps.data(), itsSetting.versions[transmission], width, buffer);
     softValues(buffer, itsCode.softSize(), itsValues.data());
     const int end = 1 << (std::min(width, 8U) - 1);

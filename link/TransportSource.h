@@ -69,6 +69,8 @@ public:
     }
 
 private:
+    template <class Value>
+    Value* bufferOf(std::vector<Value>& buffers, unsigned frame, unsigned transmission) const;
     void receive(unsigned frame, unsigned transmission);
     std::uint32_t recover(unsigned frame, unsigned transmission);
     std::uint32_t recoverSteps(unsigned frame, unsigned transmission);
@@ -86,7 +88,7 @@ private:
     std::vector<std::uint64_t> itsCoded;
     std::vector<float> itsRatios;
     std::vector<std::int16_t> itsSteps;
-    std::vector<float> itsSoftBuffers;         ///< of each frame, if values are added up as floats
+    std::vector<float> itsSoftBuffers;         ///< if values are added up as floats
     std::vector<std::int16_t> itsStepBuffers;  ///< otherwise
     std::vector<std::int8_t> itsValues;
 };

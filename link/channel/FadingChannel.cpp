@@ -58,7 +58,6 @@ FadingChannel::FadingChannel(
 void FadingChannel::pass(
     std::uint64_t frame, unsigned transmission, std::uint32_t first, std::uint32_t count, float* symbols, float* gains)
 {
-    itsNumbers.resize(std::size_t{2} * count);
     if (hasGains()) {
         drawGains(FrameRandom(itsKey, 2 * transmission + 1, frame), first, count, gains);
         for (std::size_t i = 0; i < count; ++i) {
@@ -67,20 +66,22 @@ void FadingChannel::pass(
             }
         }
     }
-    const std::uint32_t numbers = itsDimensions * count;
-    itsSampler.draw(FrameRandom(itsKey, 2 * transmission, frame), itsDimensions * first, numbers, itsNumbers.data());
-    for (std::uint32_t i = 0; i < numbers; ++i) {
-        symbols[i] += static_cast<float>(itsNumbers[i]) * itsNoiseStep;
-    }
+    itsSampler.add(FrameRandom(itsKey, 2 * transmission, frame),
+                   itsDimensions * first,
+                   itsDimensions * count,
+                   itsNoiseStep,
+                   symbols);
 }
 
 void FadingChannel::drawGains(const FrameRandom& random, std::uint32_t first, std::uint32_t count, float* gains)
 {
     if (itsFading == Fading::constant) {
-        itsSampler.draw(random, 0, 2, itsNumbers.data());
-        std::fill_n(gains, count, amplitude(itsNumbers[0], itsNumbers[1]));
+        std::array<std::int16_t, 2> numbers;
+        itsSampler.draw(random, 0, 2, numbers.data());
+        std::fill_n(gains, count, amplitude(numbers[0], numbers[1]));
         return;
     }
+    itsNumbers.resize(std::max(itsNumbers.size(), std::size_t{2} * count));
     itsSampler.draw(random, 2 * first, 2 * count, itsNumbers.data());
     for (std::size_t i = 0; i < count; ++i) {
         gains[i] = amplitude(itsNumbers[2 * i], itsNumbers[2 * i + 1]);

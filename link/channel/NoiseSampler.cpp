@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <array>
 
+#include "link/kernels/RowKernels.h"
+
 namespace morvik::link {
 
 namespace {
@@ -20,6 +22,12 @@ constexpr std::array<std::uint64_t, 64> allOnes()
         word = ~std::uint64_t{0};
     }
     return words;
+}
+
+/// Byte i % 8 of a word belongs to number i.
+const std::uint8_t* bytesOf(const std::uint64_t* words)
+{
+    return reinterpret_cast<const std::uint8_t*>(words);
 }
 
 }  // namespace
@@ -59,27 +67,35 @@ NoiseSampler::NoiseSampler(const RandomKey& key, const SamplerForm& form)
 void NoiseSampler::draw(const FrameRandom& random, std::uint32_t first, std::uint32_t count, std::int16_t* numbers)
 {
     for (std::uint32_t done = 0; done < count; done += partSize) {
-        drawPart(random, first + done, std::min(partSize, count - done), numbers + done);
+        const std::uint32_t now = std::min(partSize, count - done);
+        drawParts(random, first + done, now);
+        for (std::uint32_t i = 0; i < now; ++i) {
+            numbers[done + i] = static_cast<std::int16_t>(256 * itsSteps[i] + bytesOf(itsFine.lows())[i] +
+                                                          bytesOf(itsFine.highs())[i] - 255);
+        }
     }
 }
 
-void NoiseSampler::drawPart(const FrameRandom& random, std::uint32_t first, std::uint32_t count, std::int16_t* numbers)
+void NoiseSampler::add(const FrameRandom& random, std::uint32_t first, std::uint32_t count, float unit, float* sums)
+{
+    for (std::uint32_t done = 0; done < count; done += partSize) {
+        const std::uint32_t now = std::min(partSize, count - done);
+        drawParts(random, first + done, now);
+        rowKernels().addNoise(
+            itsSteps.data(), bytesOf(itsFine.lows()), bytesOf(itsFine.highs()), now, unit, sums + done);
+    }
+}
+
+/// Draws d, u and v of up to `partSize` numbers.
+void NoiseSampler::drawParts(const FrameRandom& random, std::uint32_t first, std::uint32_t count)
 {
     static constexpr auto ones = allOnes();
     std::uint32_t clipped = 0;  // d does not reach the ends
     itsCoarse.put(random, first, ones.data(), count, itsSteps.data(), clipped);
     itsCoarse.draw();
-
     itsFine.clear();
     itsFine.put(random.counterLow(random_index::fineNoise + first / 8), random.counterHigh(), (count + 7) / 8);
     itsFine.draw();
-    // Byte i % 8 of a word belongs to number i.
-    const auto* const u = reinterpret_cast<const std::uint8_t*>(itsFine.lows());
-    const auto* const v = reinterpret_cast<const std::uint8_t*>(itsFine.highs());
-    const std::int8_t* const steps = itsSteps.data();
-    for (std::uint32_t i = 0; i < count; ++i) {
-        numbers[i] = static_cast<std::int16_t>(256 * steps[i] + u[i] + v[i] - 255);
-    }
 }
 
 }  // namespace morvik::link

@@ -32,8 +32,11 @@ public:
     /// not depend on how a range is split.
     void draw(const FrameRandom& random, std::uint32_t first, std::uint32_t count, std::int16_t* numbers);
 
+    /// Adds the same numbers, each times `unit`, to floats.
+    void add(const FrameRandom& random, std::uint32_t first, std::uint32_t count, float unit, float* sums);
+
 private:
-    void drawPart(const FrameRandom& random, std::uint32_t first, std::uint32_t count, std::int16_t* numbers);
+    void drawParts(const FrameRandom& random, std::uint32_t first, std::uint32_t count);
 
     SoftValueSampler itsCoarse;
     RandomBatch itsFine;

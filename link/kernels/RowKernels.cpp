@@ -26,6 +26,24 @@ void addClipped(const std::int16_t* numbers, std::size_t count, std::int32_t mos
     }
 }
 
+void addNoise(
+    const std::int8_t* d, const std::uint8_t* u, const std::uint8_t* v, std::size_t count, float unit, float* sums)
+{
+    for (std::size_t i = 0; i < count; ++i) {
+        sums[i] += static_cast<float>(256 * d[i] + u[i] + v[i] - 255) * unit;
+    }
+}
+
+std::uint32_t countOutside(const float* numbers, std::size_t count, float scale, float low, float high)
+{
+    std::uint32_t outside = 0;
+    for (std::size_t i = 0; i < count; ++i) {
+        const float value = numbers[i] * scale;
+        outside += value > low && value < high ? 0U : 1U;
+    }
+    return outside;
+}
+
 template <typename Integer>
 void roundTo(const float* numbers, std::size_t count, float scale, float end, Integer* rounded)
 {
@@ -318,6 +336,8 @@ extern const RowKernels kernels;
 const RowKernels kernels = {MORVIK_LINK_SET_NAME,
                             add,
                             addClipped,
+                            addNoise,
+                            countOutside,
                             roundTo<std::int8_t>,
                             roundTo<std::int16_t>,
                             rowsOfOne,

@@ -33,6 +33,13 @@ struct RowKernels {
     /// Adds, and clips to -most - 1 ... most.
     void (*addClipped)(const std::int16_t* numbers, std::size_t count, std::int32_t most, std::int16_t* sums);
 
+    /// Adds noise: numbers 256 d + u + v - 255, times a unit.
+    void (*addNoise)(
+        const std::int8_t* d, const std::uint8_t* u, const std::uint8_t* v, std::size_t count, float unit, float* sums);
+
+    /// How many products with a scale are not between the limits.
+    std::uint32_t (*countOutside)(const float* numbers, std::size_t count, float scale, float low, float high);
+
     /// Products with a scale, rounded with halves away from 0, clipped to -end ... end - 1. NaN becomes -end. Of bytes,
     /// `end` is at most 128.
     void (*roundToBytes)(const float* numbers, std::size_t count, float scale, float end, std::int8_t* rounded);
