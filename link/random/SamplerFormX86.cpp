@@ -157,7 +157,19 @@ MORVIK_AVX512 void drawAvx512(const AliasTable& table, const RandomKey& key, Val
 MORVIK_AVX512 void randomBlocksAvx512(const RandomKey& key, std::uint64_t* low, std::uint64_t* high, std::size_t count)
 {
     const RoundKeys keys(key);
-    for (std::size_t done = 0; done < count; done += 8) {
+    std::size_t done = 0;
+    for (; done + 32 <= count; done += 32) {  // four vectors hide each other's latency
+        Random512 random[4];
+        for (std::size_t v = 0; v < 4; ++v) {
+            random[v] = {_mm512_loadu_si512(low + done + 8 * v), _mm512_loadu_si512(high + done + 8 * v)};
+        }
+        philox(keys, random);
+        for (std::size_t v = 0; v < 4; ++v) {
+            _mm512_storeu_si512(low + done + 8 * v, random[v].low);
+            _mm512_storeu_si512(high + done + 8 * v, random[v].high);
+        }
+    }
+    for (; done < count; done += 8) {
         const auto used = static_cast<__mmask8>(lowBits(static_cast<unsigned>(std::min<std::size_t>(8, count - done))));
         Random512 random[] = {
             {_mm512_maskz_loadu_epi64(used, low + done), _mm512_maskz_loadu_epi64(used, high + done)}};

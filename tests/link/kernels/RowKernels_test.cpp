@@ -17,6 +17,7 @@ using morvik::blocks::between;
 using morvik::blocks::Random;
 using morvik::link::DimensionRow;
 using morvik::link::RowKernels;
+using morvik::link::rowKernels;
 using morvik::link::rowKernelSets;
 
 std::vector<float> randomNumbers(Random& random, std::size_t count)
@@ -64,7 +65,7 @@ TEST(RowKernelsTest, HaveNamesAndEndWithTheGenericSet)
         EXPECT_TRUE(names.insert(set->name).second);
     }
     EXPECT_STREQ(rowKernelSets().back()->name, "generic");
-    EXPECT_EQ(&morvik::link::rowKernels(), rowKernelSets().front());
+    EXPECT_EQ(&rowKernels(), rowKernelSets().front());
 }
 
 TEST(RowKernelsTest, AddAndRoundAlike)
@@ -104,6 +105,31 @@ TEST(RowKernelsTest, AddAndRoundAlike)
             });
         }
     }
+}
+
+TEST(RowKernelsTest, AddNoiseAndCountAlike)
+{
+    Random random(4);
+    for (std::size_t count = 0; count < 200; count += 11) {
+        const std::vector<float> start = randomNumbers(random, count);
+        const auto d = randomIntegers<std::int8_t>(random, count);
+        const auto u = randomIntegers<std::uint8_t>(random, count);
+        const auto v = randomIntegers<std::uint8_t>(random, count);
+        expectSame([&](const RowKernels& set) {
+            std::vector<float> to = start;
+            set.addNoise(d.data(), u.data(), v.data(), count, 0.1F, to.data());
+            return to;
+        });
+        for (const RowKernels* const set : rowKernelSets()) {
+            std::uint32_t outside = 0;
+            for (const float number : start) {
+                outside += number * 3 <= -20.5F || number * 3 >= 30 ? 1U : 0U;
+            }
+            EXPECT_EQ(set->countOutside(start.data(), count, 3, -20.5F, 30), outside) << set->name;
+        }
+    }
+    const std::vector<float> ends = {-8, 8, 7.9375F, -7.9375F, std::numeric_limits<float>::quiet_NaN()};
+    EXPECT_EQ(rowKernels().countOutside(ends.data(), ends.size(), 1, -8, 8), 3U) << "the limits are outside, as is NaN";
 }
 
 TEST(RowKernelsTest, MakeRowsOfColumnsAlike)
