@@ -74,9 +74,9 @@ void checkTogether(const LinkOptions& options, bool hasBlockSize)
 bool fitsBuffer(const LinkFormat& format, unsigned softBufferSize)
 {
     try {
-        link::TransportBlockCode(
+        const link::TransportBlockCode code(
             {format.transportBlockSize, format.codedBits, bitsPerSymbol(format.modulation), 1, softBufferSize});
-        return true;
+        return code.softSize() > 0;
     } catch (const std::invalid_argument&) {
         return false;
     }
@@ -116,7 +116,8 @@ void checkFormat(const LinkFormat& format, const std::string& size)
 /// Whole symbols that meet a rate in thousandths most closely; at least one for each code block.
 unsigned codedBitsAt(unsigned size, int rate, unsigned perSymbol)
 {
-    const std::uint64_t symbols = (std::uint64_t{size} * 2000 / (static_cast<unsigned>(rate) * perSymbol) + 1) / 2;
+    const std::uint64_t thousandths = std::uint64_t{static_cast<unsigned>(rate)} * perSymbol;
+    const std::uint64_t symbols = (std::uint64_t{size} * 2000 / thousandths + 1) / 2;
     const std::uint64_t least = link::codeBlocksOf(size).count;
     return static_cast<unsigned>(std::min<std::uint64_t>(std::max(symbols, least) * perSymbol, UINT32_MAX));
 }
