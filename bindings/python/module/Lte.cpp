@@ -7,12 +7,17 @@
 #include <cstdint>
 #include <memory>
 #include <optional>
+#include <string>
 #include <type_traits>
 #include <vector>
 
 #include "Arrays.h"
 #include "Decoder.h"
 #include "link/RatioScale.h"
+#include "link/SymbolLink.h"
+#include "link/coding/PackedBits.h"
+#include "link/random/Random.h"
+#include "link/random/SamplerForm.h"
 #include "morvik_link.h"
 #include "rules/Tail.h"
 
@@ -227,6 +232,31 @@ Array<float> demap(std::uint32_t bitsPerSymbol,
     return ratios;
 }
 
+/// The ratios of rows of coded bits, each a frame of a simulation with this seed. The package has checked the names.
+Array<float> transmit(const Array<std::uint8_t>& bits,
+                      std::uint32_t bitsPerSymbol,
+                      const std::string& channel,
+                      const std::string& demapper,
+                      int milliDecibels,
+                      std::uint64_t seed)
+{
+    const link::SymbolFormat format{link::modulations[bitsPerSymbol / 2],
+                                    link::fadingOf(channel).value(),
+                                    link::demapperOf(demapper).value(),
+                                    milliDecibels};
+    Array<float> ratios = matrix<float>(rows(bits), columns(bits));
+    run([&, from = bits.data(), to = ratios.mutable_data(), count = columns(bits), blocks = rows(bits)] {
+        link::SymbolLink symbols(format, link::randomKey(seed), link::samplerForms().front());
+        std::vector<std::uint64_t> packed(link::wordsOf(count));
+        for (std::size_t b = 0; b < blocks; ++b) {
+            link::packBits(from + b * count, count, packed.data());
+            symbols.receive(b, 0, packed.data(), count, to + b * count);
+        }
+        return MORVIK_LINK_OK;
+    });
+    return ratios;
+}
+
 // ---- Transport blocks
 
 /// A transmitter and receiver of one format.
@@ -417,6 +447,14 @@ void addLte(py::module_& module)
                arg("symbols").noconvert(),
                arg("gains"),
                arg("noise_variance"));
+    module.def("transmit_symbols",
+               transmit,
+               arg("bits").noconvert(),
+               arg("bits_per_symbol"),
+               arg("channel"),
+               arg("demapper"),
+               arg("milli_decibels"),
+               arg("seed"));
     addTransport(module);
 }
 

@@ -79,6 +79,10 @@ def demap(
     noise_variance: float,
 ) -> npt.NDArray[np.float32]: ...
 
+def transmit_symbols(
+    bits: npt.NDArray[np.uint8], bits_per_symbol: int, channel: str, demapper: str, milli_decibels: int, seed: int
+) -> npt.NDArray[np.float32]: ...
+
 class Transport:
     def __init__(
         self, size: int, coded_bits: int, bits_per_symbol: int, layers: int, soft_buffer_size: int

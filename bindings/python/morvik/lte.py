@@ -29,16 +29,27 @@ from morvik import _core
 from morvik._arguments import (
     DEFAULT_ITERATIONS,
     algorithm_number,
-    block_size as checked_block_size,
     expect_block,
-    expect_unmasked,
     integer,
     plain_array,
     real,
+    thousandths,
 )
 from morvik._decoder import Decoder
 from morvik._errors import Error
 from morvik._link import Streams, bits_of, three_streams
+from morvik._lte_arguments import (
+    checked_gains,
+    checked_matching,
+    checked_ratios,
+    checked_received,
+    checked_transport_block_size,
+    checked_version,
+    checked_width,
+    positive,
+    rows_of,
+    sums_of,
+)
 
 __all__ = [
     "CodeBlock",
@@ -55,10 +66,12 @@ __all__ = [
     "scale_of",
     "segment",
     "soft_values",
+    "transmit",
 ]
 
 _BITS_PER_SYMBOL = {"bpsk": 1, "qpsk": 2, "16qam": 4, "64qam": 6, "256qam": 8}
 _DEMAPPERS = ("max-log", "exact")
+_CHANNELS = ("awgn", "rayleigh", "block-rayleigh")
 _CRC_BITS = 24
 _FILLER = -128  # the core's strongest 0
 _MOST = 2**32 - 1
@@ -133,7 +146,7 @@ def crc24b(bits: npt.ArrayLike) -> npt.NDArray[np.uint8]:
 
 def segment(transport_block_size: int) -> CodeBlocks:
     """How a transport block of so many bits, without their CRC, is divided into code blocks."""
-    return CodeBlocks(*_core.segment(_transport_block_size(transport_block_size)))
+    return CodeBlocks(*_core.segment(checked_transport_block_size(transport_block_size)))
 
 
 def rate_match(
@@ -162,10 +175,10 @@ def rate_match(
     arrays = [bits_of(name, stream) for name, stream in zip(Streams._fields, three_streams(streams))]
     positions = arrays[0].shape[-1]
     expect_block("streams", positions)
-    matching = _matching(positions - 4, fillers, buffer_size)
+    matching = checked_matching(positions - 4, fillers, buffer_size)
     rows = [np.ascontiguousarray(array.reshape(-1, positions)) for array in arrays]
     count = integer("coded_bits", coded_bits, 0, _MOST)
-    return _core.rate_match(matching, _version(version), rows, count).reshape(*arrays[0].shape[:-1], count)
+    return _core.rate_match(matching, checked_version(version), rows, count).reshape(*arrays[0].shape[:-1], count)
 
 
 def rate_recover(
@@ -194,14 +207,14 @@ def rate_recover(
     Returns the soft buffers, in the order of the circular buffer, without its dummy and filler bits: float32, or int16
     with ``width``.
     """
-    matching = _matching(block_size, fillers, buffer_size)
-    array = _received(llrs, width)
-    received = _rows(array)
-    sums = _sums(buffers, (*array.shape[:-1], _core.soft_buffer_size(matching)), array.dtype)
+    matching = checked_matching(block_size, fillers, buffer_size)
+    array = checked_received(llrs, width)
+    received = rows_of(array)
+    sums = sums_of(buffers, (*array.shape[:-1], _core.soft_buffer_size(matching)), array.dtype)
     if width is None:
-        _core.rate_recover(matching, _version(version), received, sums)
+        _core.rate_recover(matching, checked_version(version), received, sums)
     else:
-        _core.rate_recover_steps(matching, _version(version), received, _width(width), sums)
+        _core.rate_recover_steps(matching, checked_version(version), received, checked_width(width), sums)
     return sums.reshape(*array.shape[:-1], -1)
 
 
@@ -222,18 +235,18 @@ def deinterleave(
 
     What was not sent and lies outside of the buffer becomes 0. Returns int8 or float32 of shape (K + 4,) or (n, K + 4).
     """
-    matching = _matching(block_size, fillers, buffer_size)
+    matching = checked_matching(block_size, fillers, buffer_size)
     size = _core.soft_buffer_size(matching)
     array = plain_array("buffers", buffers)
     if array.dtype != np.int8:
-        array = _ratios(array, "buffers")
+        array = checked_ratios(array, "buffers")
     if array.shape[-1] != size:
         raise ValueError(f"buffers must have {size} values for each block, not {array.shape[-1]}")
     streams: list[npt.NDArray[Any]]
     if array.dtype == np.int8:
-        streams = _core.deinterleave_steps(matching, _rows(array), integer("filler", filler, -128, 127))
+        streams = _core.deinterleave_steps(matching, rows_of(array), integer("filler", filler, -128, 127))
     else:
-        streams = _core.deinterleave(matching, _rows(array), real("filler", filler))
+        streams = _core.deinterleave(matching, rows_of(array), real("filler", filler))
     return Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams))
 
 
@@ -247,7 +260,7 @@ def scale_of(modulation: str, code_rate: float, *, algorithm: str | int = "scale
         The decoder's algorithm.
     """
     number = integer("algorithm", algorithm_number(algorithm), 0, 2)
-    return _core.ratio_scale(number, bits_per_symbol(modulation), _positive("code_rate", code_rate))
+    return _core.ratio_scale(number, bits_per_symbol(modulation), positive("code_rate", code_rate))
 
 
 def soft_values(llrs: npt.ArrayLike, scale: float, width: int = 8) -> npt.NDArray[Any]:
@@ -261,11 +274,11 @@ def soft_values(llrs: npt.ArrayLike, scale: float, width: int = 8) -> npt.NDArra
         Bits of a soft value. 8 gives int8, what :meth:`morvik.Decoder.decode` takes; other widths, 2 to 16, give int16,
         for soft buffers of this width.
     """
-    array = _ratios(llrs)
-    steps = _positive("scale", scale)
+    array = checked_ratios(llrs)
+    steps = positive("scale", scale)
     flat = np.ascontiguousarray(array.reshape(-1))
     values: npt.NDArray[Any]
-    if _width(width) == 8:
+    if checked_width(width) == 8:
         values = _core.soft_values(flat, steps)
     else:
         values = _core.soft_steps(flat, steps, width)
@@ -287,7 +300,8 @@ def map(bits: npt.ArrayLike, modulation: str = "qpsk") -> npt.NDArray[Any]:
     if array.shape[-1] % count != 0:
         raise ValueError(f"bits must be a multiple of the {count} of a {modulation} symbol, not {array.shape[-1]}")
     symbols = _core.map(count, np.ascontiguousarray(array.reshape(-1)))
-    return _as_symbols(symbols, count).reshape(*array.shape[:-1], array.shape[-1] // count)
+    shape = (*array.shape[:-1], array.shape[-1] // count)
+    return (symbols if count == 1 else symbols.view(np.complex64)).reshape(shape)
 
 
 def demap(
@@ -322,12 +336,52 @@ def demap(
         raise ValueError("symbols must be finite")
     if demapper not in _DEMAPPERS:
         raise ValueError(f"demapper must be one of {', '.join(_DEMAPPERS)}, not {demapper!r}")
-    amplitudes = None if gains is None else _gains(gains, array.shape)
+    amplitudes = None if gains is None else checked_gains(gains, array.shape)
     flat = np.ascontiguousarray(array.reshape(-1).astype(np.float32 if count == 1 else np.complex64, copy=False))
     llrs = _core.demap(
-        count, _DEMAPPERS.index(demapper), flat.view(np.float32), amplitudes, _positive("noise_variance", noise_variance)
+        count, _DEMAPPERS.index(demapper), flat.view(np.float32), amplitudes, positive("noise_variance", noise_variance)
     )
     return llrs.reshape(*array.shape[:-1], array.shape[-1] * count)
+
+
+def transmit(
+    bits: npt.ArrayLike,
+    modulation: str,
+    esn0_db: float,
+    *,
+    channel: str = "awgn",
+    demapper: str = "max-log",
+    rng: np.random.Generator | int | None = None,
+) -> npt.NDArray[np.float32]:
+    """Sends bits over a channel: :func:`map`, noise and fading, and :func:`demap`, in a fraction of the time that noise
+    of NumPy takes.
+
+    ``bits``
+        Coded bits of shape (G,) or (n, G), as many transmissions.
+    ``modulation``, ``demapper``
+        As for :func:`map` and :func:`demap`.
+    ``esn0_db``
+        Es/N0 in dB, -50 to 50 in steps of 0.001.
+    ``channel``
+        White Gaussian noise, ``"awgn"``; with Rayleigh fading of each symbol, ``"rayleigh"``, or of each transmission,
+        ``"block-rayleigh"``, which the receiver knows.
+    ``rng``
+        A NumPy generator, or the seed of a new one. All noise of a call follows from 64 bits that it takes from the
+        generator, and is the same on every machine.
+
+    Returns the log-likelihood ratios of the bits: float32 of the same shape.
+    """
+    count = bits_per_symbol(modulation)
+    array = bits_of("bits", bits)
+    if array.shape[-1] % count != 0:
+        raise ValueError(f"bits must be a multiple of the {count} of a {modulation} symbol, not {array.shape[-1]}")
+    for name, value, allowed in (("channel", channel, _CHANNELS), ("demapper", demapper, _DEMAPPERS)):
+        if value not in allowed:
+            raise ValueError(f"{name} must be one of {', '.join(allowed)}, not {value!r}")
+    decibels = thousandths("esn0_db", esn0_db, -50, 50)
+    seed = int.from_bytes(np.random.default_rng(rng).bytes(8), "little")
+    rows = np.ascontiguousarray(array.reshape(-1, array.shape[-1]))
+    return _core.transmit_symbols(rows, count, channel, demapper, decibels, seed).reshape(array.shape)
 
 
 def bits_per_symbol(modulation: str) -> int:
@@ -364,7 +418,7 @@ class Transport:
         layers: int = 1,
         soft_buffer_size: int | None = None,
     ) -> None:
-        self._size = _transport_block_size(transport_block_size)
+        self._size = checked_transport_block_size(transport_block_size)
         self._coded_bits = integer("coded_bits", coded_bits, 1, _MOST)
         self._modulation = modulation
         self._code_blocks = segment(self._size)
@@ -385,7 +439,7 @@ class Transport:
         of shape (G,) or (n, G)."""
         array = bits_of("bits", bits)
         self._expect_columns("bits", array, self._size)
-        coded = self._core.encode(_version(version), np.ascontiguousarray(array.reshape(-1, self._size)))
+        coded = self._core.encode(checked_version(version), np.ascontiguousarray(array.reshape(-1, self._size)))
         return coded.reshape(*array.shape[:-1], self._coded_bits)
 
     def recover(
@@ -406,14 +460,14 @@ class Transport:
 
         Returns the soft buffers: float32, or int16 with ``width``.
         """
-        array = _received(llrs, width)
+        array = checked_received(llrs, width)
         self._expect_columns("llrs", array, self._coded_bits)
-        received = _rows(array)
-        sums = _sums(buffers, (*array.shape[:-1], self._core.buffer_size), array.dtype)
+        received = rows_of(array)
+        sums = sums_of(buffers, (*array.shape[:-1], self._core.buffer_size), array.dtype)
         if width is None:
-            self._core.recover(_version(version), received, sums)
+            self._core.recover(checked_version(version), received, sums)
         else:
-            self._core.recover_steps(_version(version), received, _width(width), sums)
+            self._core.recover_steps(checked_version(version), received, checked_width(width), sums)
         return sums.reshape(*array.shape[:-1], -1)
 
     def soft_values(
@@ -433,12 +487,12 @@ class Transport:
         if is_steps and scale is not None:
             raise ValueError("scale must be None for buffers of whole steps, which were scaled before")
         if not is_steps:
-            array = _ratios(array, "buffers")
+            array = checked_ratios(array, "buffers")
         self._expect_columns("buffers", array, self._core.buffer_size)
-        rows = _rows(array)
+        rows = rows_of(array)
         if scale is None:
             scale = scale_of(self._modulation, self._size / self._coded_bits, algorithm=algorithm)
-        steps = _positive("scale", scale)
+        steps = positive("scale", scale)
         blocks = (
             self._core.soft_values_of_steps(r, rows) if is_steps else self._core.soft_values(r, rows, steps)
             for r in range(self._code_blocks.number)
@@ -530,99 +584,7 @@ class Transport:
             raise ValueError(f"{name} must have {columns} values for each block, not {array.shape[-1]}")
 
 
-# ---- Arguments
-
-
 def _crc(bits: npt.ArrayLike, is_of_code_block: bool) -> npt.NDArray[np.uint8]:
     array = bits_of("bits", bits)
     parity = _core.crc(np.ascontiguousarray(array.reshape(-1, array.shape[-1])), is_of_code_block)
     return parity.reshape(*array.shape[:-1], _CRC_BITS)
-
-
-def _transport_block_size(value: Any) -> int:
-    return integer("transport_block_size", value, 1, 2**24)
-
-
-def _matching(block_size: Any, fillers: Any, buffer_size: Any) -> tuple[int, int, int]:
-    size = checked_block_size(block_size)
-    positions = 0 if buffer_size is None else integer("buffer_size", buffer_size, 1, _MOST)
-    matching = (size, integer("fillers", fillers, 0, size - 1), positions)
-    try:
-        _core.soft_buffer_size(matching)
-    except Error as error:
-        raise Error(f"{error} (block_size={size}, fillers={fillers!r}, buffer_size={buffer_size!r})") from None
-    return matching
-
-
-def _version(value: Any) -> int:
-    return integer("version", value, 0, 3)
-
-
-def _width(value: Any) -> int:
-    return integer("width", value, 2, 16)
-
-
-def _positive(name: str, value: Any) -> float:
-    number = real(name, value)
-    if not 0 < number < 3e38 or np.float32(number) == 0:
-        raise ValueError(f"{name} must be a positive number that float32 holds, not {value!r}")
-    return number
-
-
-def _ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.float32]:
-    """The values as float32 in C order, finite."""
-    array = plain_array(name, values)
-    if array.dtype.kind not in "fiu":
-        raise TypeError(f"{name} must hold real numbers, not {array.dtype}")
-    if array.ndim == 0:
-        raise ValueError(f"{name} must be an array, not a number")
-    wrong = np.argwhere(~np.isfinite(array))
-    if len(wrong) > 0:
-        place = ", ".join(str(index) for index in wrong[0])
-        raise ValueError(f"{name} must be finite, but [{place}] is {array[tuple(wrong[0])]}")
-    return np.ascontiguousarray(array, np.float32)
-
-
-def _steps(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
-    array = plain_array(name, values)
-    if array.dtype not in (np.int8, np.int16):
-        raise TypeError(f"{name} must hold whole steps, as int8 or int16, with a width, not {array.dtype}")
-    if array.ndim == 0:
-        raise ValueError(f"{name} must be an array, not a number")
-    return np.ascontiguousarray(array, np.int16)
-
-
-def _received(llrs: npt.ArrayLike, width: int | None) -> npt.NDArray[Any]:
-    if width is None:
-        return _ratios(llrs)
-    return _steps("llrs", llrs)
-
-
-def _rows(array: npt.NDArray[Any]) -> npt.NDArray[Any]:
-    if array.ndim > 2:
-        raise ValueError(f"arrays must have one or two dimensions, not {array.ndim}")
-    return array.reshape(-1, array.shape[-1])
-
-
-def _sums(buffers: Any, shape: tuple[int, ...], dtype: Any) -> npt.NDArray[Any]:
-    """A copy of the soft buffers as rows, or zeros."""
-    if buffers is None:
-        return np.zeros(shape, dtype).reshape(-1, shape[-1])
-    expect_unmasked("buffers", buffers)
-    array = np.asarray(buffers)
-    if array.shape != shape or array.dtype != dtype:
-        raise ValueError(f"buffers must be {dtype} of shape {shape}, not {array.dtype} of shape {array.shape}")
-    return np.array(array, order="C").reshape(-1, shape[-1])
-
-
-def _gains(gains: npt.ArrayLike, shape: tuple[int, ...]) -> npt.NDArray[np.float32]:
-    array = _ratios(gains, "gains")
-    if array.shape != shape:
-        raise ValueError(f"gains must have the shape of symbols, {shape}, not {array.shape}")
-    if array.size > 0 and array.min() < 0:
-        raise ValueError("gains must be at least 0: the phase of symbols is turned back before")
-    return array.reshape(-1)
-
-
-def _as_symbols(numbers: npt.NDArray[np.float32], bits: int) -> npt.NDArray[Any]:
-    return numbers if bits == 1 else numbers.view(np.complex64)

@@ -148,6 +148,32 @@ def test_ratios_are_those_of_all_points(modulation, demapper):
         assert llrs[:, bit] == pytest.approx(expected, rel=1e-3, abs=1e-4)
 
 
+@pytest.mark.parametrize("modulation", MODULATIONS.values())
+def test_noise_of_the_chain_is_that_of_the_channel(modulation):
+    bits = np.random.default_rng(5).integers(0, 2, (4, 24000))
+    llrs = lte.transmit(bits, modulation, 3.0, rng=6)
+    assert llrs.shape == bits.shape and llrs.dtype == np.float32
+    symbols = lte.map(bits, modulation)
+    deviation = np.sqrt(10**-0.3 / 2)
+    rng = np.random.default_rng(7)
+    noise = rng.normal(0, deviation, symbols.shape)
+    noise = noise if modulation == "bpsk" else noise + 1j * rng.normal(0, deviation, symbols.shape)
+    plain = lte.demap(symbols + noise, modulation, 10**-0.3)
+    sign = 2 * bits - 1
+    for power in (1, 2):
+        assert np.mean((llrs * sign) ** power) == pytest.approx(np.mean((plain * sign) ** power), rel=0.03)
+    assert np.array_equal(lte.transmit(bits, modulation, 3.0, rng=6), llrs)
+    assert not np.array_equal(llrs[0] * sign[0], llrs[1] * sign[1])
+
+
+def test_fading_of_a_transmission_is_one():
+    bits = np.zeros((200, 600), np.uint8)
+    strengths = -lte.transmit(bits, "qpsk", 20.0, channel="block-rayleigh", rng=1).mean(axis=1)
+    assert strengths.min() < 0.1 * strengths.mean() and strengths.max() > 3 * strengths.mean()
+    every = -lte.transmit(bits, "qpsk", 20.0, channel="rayleigh", rng=1).mean(axis=1)
+    assert every.mean() == pytest.approx(strengths.mean(), rel=0.3) and every.std() < 0.1 * every.mean()
+
+
 def test_soft_values_are_rounded_and_clipped():
     llrs = [[0.0, 0.0625, -0.0625, 0.06], [15.9, 16.0, -16.0, -99.0]]
     assert lte.soft_values(llrs, 8).tolist() == [[0, 1, -1, 0], [127, 127, -128, -128]]
@@ -207,6 +233,9 @@ LLRS = np.ones(2400)
         (lambda: lte.soft_values([1.0], 4, width=17), ValueError, "width must be in the range 2 to 16"),
         (lambda: lte.scale_of("qpsk", 0), ValueError, "code_rate must be a positive number"),
         (lambda: lte.map([0, 1, 1]), ValueError, "bits must be a multiple of the 2 of a qpsk symbol, not 3"),
+        (lambda: lte.transmit([0, 1, 1], "qpsk", 3), ValueError, "bits must be a multiple of the 2 of a qpsk symbol"),
+        (lambda: lte.transmit([0, 1], "qpsk", 99), ValueError, "esn0_db must be in the range -50 to 50"),
+        (lambda: lte.transmit([0, 1], "qpsk", 9, channel="fog"), ValueError, "channel must be one of awgn, rayleigh"),
         (lambda: lte.demap([1j], "bpsk", 1), TypeError, "symbols must be an array of real numbers"),
         (lambda: lte.demap([1j], "qpsk", 0), ValueError, "noise_variance must be a positive number"),
         (lambda: lte.demap([np.inf], "qpsk", 1), ValueError, "symbols must be finite"),

@@ -1,0 +1,105 @@
+"""Argument checks of the LTE chain."""
+
+from __future__ import annotations
+
+from typing import Any
+
+import numpy as np
+import numpy.typing as npt
+
+from morvik import _core
+from morvik._arguments import (
+    block_size as checked_block_size,
+    expect_unmasked,
+    integer,
+    plain_array,
+    real,
+)
+from morvik._errors import Error
+
+_MOST = 2**32 - 1
+
+
+def checked_transport_block_size(value: Any) -> int:
+    return integer("transport_block_size", value, 1, 2**24)
+
+
+def checked_matching(block_size: Any, fillers: Any, buffer_size: Any) -> tuple[int, int, int]:
+    size = checked_block_size(block_size)
+    positions = 0 if buffer_size is None else integer("buffer_size", buffer_size, 1, _MOST)
+    matching = (size, integer("fillers", fillers, 0, size - 1), positions)
+    try:
+        _core.soft_buffer_size(matching)
+    except Error as error:
+        raise Error(f"{error} (block_size={size}, fillers={fillers!r}, buffer_size={buffer_size!r})") from None
+    return matching
+
+
+def checked_version(value: Any) -> int:
+    return integer("version", value, 0, 3)
+
+
+def checked_width(value: Any) -> int:
+    return integer("width", value, 2, 16)
+
+
+def positive(name: str, value: Any) -> float:
+    number = real(name, value)
+    if not 0 < number < 3e38 or np.float32(number) == 0:
+        raise ValueError(f"{name} must be a positive number that float32 holds, not {value!r}")
+    return number
+
+
+def checked_ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.float32]:
+    """The values as float32 in C order, finite."""
+    array = plain_array(name, values)
+    if array.dtype.kind not in "fiu":
+        raise TypeError(f"{name} must hold real numbers, not {array.dtype}")
+    if array.ndim == 0:
+        raise ValueError(f"{name} must be an array, not a number")
+    wrong = np.argwhere(~np.isfinite(array))
+    if len(wrong) > 0:
+        place = ", ".join(str(index) for index in wrong[0])
+        raise ValueError(f"{name} must be finite, but [{place}] is {array[tuple(wrong[0])]}")
+    return np.ascontiguousarray(array, np.float32)
+
+
+def checked_steps(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
+    array = plain_array(name, values)
+    if array.dtype not in (np.int8, np.int16):
+        raise TypeError(f"{name} must hold whole steps, as int8 or int16, with a width, not {array.dtype}")
+    if array.ndim == 0:
+        raise ValueError(f"{name} must be an array, not a number")
+    return np.ascontiguousarray(array, np.int16)
+
+
+def checked_received(llrs: npt.ArrayLike, width: int | None) -> npt.NDArray[Any]:
+    if width is None:
+        return checked_ratios(llrs)
+    return checked_steps("llrs", llrs)
+
+
+def rows_of(array: npt.NDArray[Any]) -> npt.NDArray[Any]:
+    if array.ndim > 2:
+        raise ValueError(f"arrays must have one or two dimensions, not {array.ndim}")
+    return array.reshape(-1, array.shape[-1])
+
+
+def sums_of(buffers: Any, shape: tuple[int, ...], dtype: Any) -> npt.NDArray[Any]:
+    """A copy of the soft buffers as rows, or zeros."""
+    if buffers is None:
+        return np.zeros(shape, dtype).reshape(-1, shape[-1])
+    expect_unmasked("buffers", buffers)
+    array = np.asarray(buffers)
+    if array.shape != shape or array.dtype != dtype:
+        raise ValueError(f"buffers must be {dtype} of shape {shape}, not {array.dtype} of shape {array.shape}")
+    return np.array(array, order="C").reshape(-1, shape[-1])
+
+
+def checked_gains(gains: npt.ArrayLike, shape: tuple[int, ...]) -> npt.NDArray[np.float32]:
+    array = checked_ratios(gains, "gains")
+    if array.shape != shape:
+        raise ValueError(f"gains must have the shape of symbols, {shape}, not {array.shape}")
+    if array.size > 0 and array.min() < 0:
+        raise ValueError("gains must be at least 0: the phase of symbols is turned back before")
+    return array.reshape(-1)
