@@ -60,8 +60,9 @@ FloatDecoder::FloatDecoder(unsigned K)
     if (row == nullptr) {
         throw std::invalid_argument("a block size of " + std::to_string(K));
     }
-    for (std::uint64_t k = 0; k < K; ++k) {
-        itsPermutation[k] = static_cast<std::size_t>((row->f1 * k + row->f2 * k * k) % K);
+    for (std::size_t k = 0; k < K; ++k) {
+        const std::uint64_t i = k;
+        itsPermutation[k] = static_cast<std::size_t>((row->f1 * i + row->f2 * i * i) % K);
     }
 }
 

@@ -54,10 +54,11 @@ std::vector<bool> LossDecoders::failures(std::size_t i, const ReceivedBlocks& bl
                                 : name == "input"     ? decideInput(streams)
                                 : name == "undivided" ? decideUndivided(streams)
                                                       : decideHardware(streams);
+    const auto fillers = static_cast<std::ptrdiff_t>(itsFillers);
     std::vector<bool> failed;
     for (unsigned b = 0; b < atOnce; ++b) {
-        failed.push_back(
-            !std::equal(decisions[b].begin() + itsFillers, decisions[b].end(), blocks.sent(b).begin() + itsFillers));
+        const std::vector<unsigned char>& sent = blocks.sent(b);
+        failed.push_back(!std::equal(sent.begin() + fillers, sent.end(), decisions[b].begin() + fillers));
     }
     return failed;
 }
@@ -176,8 +177,8 @@ LossDecoders::Decisions LossDecoders::decideHardware(const Streams& streams)
         throw std::runtime_error("the decoder has refused a block");
     }
     Decisions decisions;
-    for (auto block = bits.begin(); block != bits.end(); block += itsK) {
-        decisions.emplace_back(block, block + itsK);
+    for (std::size_t b = 0; b < atOnce; ++b) {
+        decisions.emplace_back(&bits[b * itsK], &bits[b * itsK] + itsK);
     }
     return decisions;
 }
