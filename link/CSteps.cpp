@@ -99,15 +99,15 @@ std::int32_t morvik_link_crc24b(const std::uint8_t* bits, std::size_t count, std
     return writeParity<link::crc24b>(bits, count, parity);
 }
 
-std::int32_t morvik_link_segment(std::uint32_t transport_block_size, morvik_link_code_blocks* code_blocks)
+std::int32_t morvik_link_segment(std::uint32_t transportBlockSize, morvik_link_code_blocks* codeBlocks)
 {
-    if (anyNull(code_blocks)) {
+    if (anyNull(codeBlocks)) {
         return MORVIK_LINK_NULL_POINTER;
     }
-    const std::int32_t status = checkedTransportBlockSize(transport_block_size);
+    const std::int32_t status = checkedTransportBlockSize(transportBlockSize);
     return guarded(status, [=] {
-        const link::CodeBlocks blocks = link::codeBlocksOf(transport_block_size);
-        *code_blocks = {
+        const link::CodeBlocks blocks = link::codeBlocksOf(transportBlockSize);
+        *codeBlocks = {
             blocks.count, blocks.fillers, blocks.sizePlus, blocks.countPlus, blocks.sizeMinus, blocks.countMinus};
     });
 }
@@ -146,7 +146,7 @@ std::int32_t morvik_link_turbo_encode(std::uint32_t K,
 
 std::int32_t morvik_link_rate_match(std::uint32_t K,
                                     std::uint32_t fillers,
-                                    std::uint32_t buffer_size,
+                                    std::uint32_t bufferSize,
                                     std::uint32_t version,
                                     std::size_t blocks,
                                     const std::uint8_t* sys,
@@ -160,7 +160,7 @@ std::int32_t morvik_link_rate_match(std::uint32_t K,
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version));
     return guarded(status, [=] {
-        const link::RateMatching matching(K, fillers, unlimited(buffer_size));
+        const link::RateMatching matching(K, fillers, unlimited(bufferSize));
         const std::size_t length = K + morvik::rules::tailPositions;
         std::vector<std::uint64_t> buffer(link::wordsOf(matching.size()));
         std::vector<std::uint64_t> row(link::wordsOf(count));
@@ -176,19 +176,19 @@ std::int32_t morvik_link_rate_match(std::uint32_t K,
 
 std::int32_t morvik_link_soft_buffer_size(std::uint32_t K,
                                           std::uint32_t fillers,
-                                          std::uint32_t buffer_size,
+                                          std::uint32_t bufferSize,
                                           std::uint32_t* size)
 {
     if (anyNull(size)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedCodeBlock(K, fillers),
-                   [=] { *size = link::RateMatching(K, fillers, unlimited(buffer_size)).size(); });
+                   [=] { *size = link::RateMatching(K, fillers, unlimited(bufferSize)).size(); });
 }
 
 std::int32_t morvik_link_rate_recover(std::uint32_t K,
                                       std::uint32_t fillers,
-                                      std::uint32_t buffer_size,
+                                      std::uint32_t bufferSize,
                                       std::uint32_t version,
                                       std::size_t blocks,
                                       const float* ratios,
@@ -200,7 +200,7 @@ std::int32_t morvik_link_rate_recover(std::uint32_t K,
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version));
     return guarded(status, [=] {
-        const link::RateMatching matching(K, fillers, unlimited(buffer_size));
+        const link::RateMatching matching(K, fillers, unlimited(bufferSize));
         for (std::size_t b = 0; b < blocks; ++b) {
             matching.recover(ratios + b * count, version, count, buffers + b * matching.size());
         }
@@ -209,7 +209,7 @@ std::int32_t morvik_link_rate_recover(std::uint32_t K,
 
 std::int32_t morvik_link_rate_recover_i16(std::uint32_t K,
                                           std::uint32_t fillers,
-                                          std::uint32_t buffer_size,
+                                          std::uint32_t bufferSize,
                                           std::uint32_t version,
                                           std::size_t blocks,
                                           const std::int16_t* steps,
@@ -222,7 +222,7 @@ std::int32_t morvik_link_rate_recover_i16(std::uint32_t K,
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version), checkedWidth(width));
     return guarded(status, [=] {
-        const link::RateMatching matching(K, fillers, unlimited(buffer_size));
+        const link::RateMatching matching(K, fillers, unlimited(bufferSize));
         for (std::size_t b = 0; b < blocks; ++b) {
             matching.recover(steps + b * count, version, count, width, buffers + b * matching.size());
         }
@@ -231,7 +231,7 @@ std::int32_t morvik_link_rate_recover_i16(std::uint32_t K,
 
 std::int32_t morvik_link_deinterleave(std::uint32_t K,
                                       std::uint32_t fillers,
-                                      std::uint32_t buffer_size,
+                                      std::uint32_t bufferSize,
                                       std::size_t blocks,
                                       const float* buffers,
                                       float filler,
@@ -239,12 +239,12 @@ std::int32_t morvik_link_deinterleave(std::uint32_t K,
                                       float* par1,
                                       float* par2)
 {
-    return deinterleave<float>(K, fillers, buffer_size, blocks, buffers, filler, {sys, par1, par2});
+    return deinterleave<float>(K, fillers, bufferSize, blocks, buffers, filler, {sys, par1, par2});
 }
 
 std::int32_t morvik_link_deinterleave_i8(std::uint32_t K,
                                          std::uint32_t fillers,
-                                         std::uint32_t buffer_size,
+                                         std::uint32_t bufferSize,
                                          std::size_t blocks,
                                          const std::int8_t* buffers,
                                          std::int8_t filler,
@@ -252,7 +252,7 @@ std::int32_t morvik_link_deinterleave_i8(std::uint32_t K,
                                          std::int8_t* par1,
                                          std::int8_t* par2)
 {
-    return deinterleave<std::int8_t>(K, fillers, buffer_size, blocks, buffers, filler, {sys, par1, par2});
+    return deinterleave<std::int8_t>(K, fillers, bufferSize, blocks, buffers, filler, {sys, par1, par2});
 }
 
 std::int32_t morvik_link_soft_values(const float* ratios, std::size_t count, float scale, std::int8_t* values)
@@ -273,22 +273,22 @@ std::int32_t morvik_link_soft_values_i16(
     return guarded(status, [=] { link::softValues(ratios, count, scale, width, values); });
 }
 
-std::int32_t morvik_link_map(std::uint32_t bits_per_symbol, const std::uint8_t* bits, std::size_t count, float* symbols)
+std::int32_t morvik_link_map(std::uint32_t bitsPerSymbol, const std::uint8_t* bits, std::size_t count, float* symbols)
 {
     if (anyNull(bits, symbols)) {
         return MORVIK_LINK_NULL_POINTER;
     }
-    return guarded(checkedBitsPerSymbol(bits_per_symbol), [=] {
-        const std::vector<std::uint64_t> row = packed(bits, count * bits_per_symbol);
-        link::mapSymbols(modulationOf(bits_per_symbol), row.data(), count, symbols);
+    return guarded(checkedBitsPerSymbol(bitsPerSymbol), [=] {
+        const std::vector<std::uint64_t> row = packed(bits, count * bitsPerSymbol);
+        link::mapSymbols(modulationOf(bitsPerSymbol), row.data(), count, symbols);
     });
 }
 
-std::int32_t morvik_link_demap(std::uint32_t bits_per_symbol,
+std::int32_t morvik_link_demap(std::uint32_t bitsPerSymbol,
                                std::int32_t demapper,
                                const float* symbols,
                                const float* gains,
-                               float noise_variance,
+                               float noiseVariance,
                                std::size_t count,
                                float* ratios)
 {
@@ -296,15 +296,15 @@ std::int32_t morvik_link_demap(std::uint32_t bits_per_symbol,
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status =
-        firstOf(checkedBitsPerSymbol(bits_per_symbol),
+        firstOf(checkedBitsPerSymbol(bitsPerSymbol),
                 unless(demapper == MORVIK_LINK_MAX_LOG || demapper == MORVIK_LINK_EXACT, MORVIK_LINK_DEMAPPER),
-                checkedPositive(noise_variance, MORVIK_LINK_NOISE_VARIANCE));
+                checkedPositive(noiseVariance, MORVIK_LINK_NOISE_VARIANCE));
     return guarded(status, [=] {
-        link::demapSymbols(modulationOf(bits_per_symbol),
+        link::demapSymbols(modulationOf(bitsPerSymbol),
                            demapper == MORVIK_LINK_EXACT ? link::Demapper::exact : link::Demapper::maxLog,
                            symbols,
                            gains,
-                           noise_variance,
+                           noiseVariance,
                            count,
                            ratios);
     });
