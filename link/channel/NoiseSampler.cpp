@@ -50,7 +50,9 @@ RoundedDistribution coarseNoise()
     const double unit = static_cast<double>(all) / sum;
     std::uint64_t given = 0;
     for (unsigned d = mostSteps; d > 0; --d) {
-        const auto weight = static_cast<std::uint64_t>(densities[d] * unit + 0.5);
+        const double exact = densities[d] * unit;
+        auto weight = static_cast<std::uint64_t>(exact);
+        weight += exact - static_cast<double>(weight) >= 0.5 ? 1U : 0U;
         distribution.weights[d] = weight;
         distribution.weights[256 - d] = weight;
         given += 2 * weight;

@@ -31,13 +31,27 @@ std::uint64_t spreadEight(std::uint64_t bits)
 
 void copyBits(const std::uint64_t* from, std::size_t first, std::size_t count, std::uint64_t* row, std::size_t to)
 {
-    while (count > 0) {
+    const auto copyPart = [&](std::size_t bits) {
         const std::size_t shift = to % 64;
-        const std::size_t now = std::min(count, 64 - shift);
-        row[to / 64] = (row[to / 64] & ~(lowBits(now) << shift)) | bitsAt(from, first, now) << shift;
-        first += now;
-        to += now;
-        count -= now;
+        row[to / 64] = (row[to / 64] & ~(lowBits(bits) << shift)) | bitsAt(from, first, bits) << shift;
+        first += bits;
+        to += bits;
+        count -= bits;
+    };
+    if (to % 64 != 0 && count > 0) {
+        copyPart(std::min(count, 64 - to % 64));
+    }
+    const std::size_t words = count / 64;
+    const std::size_t shift = first % 64;
+    const std::uint64_t* const source = from + first / 64;
+    for (std::size_t i = 0; i < words; ++i) {
+        row[to / 64 + i] = shift == 0 ? source[i] : source[i] >> shift | source[i + 1] << (64 - shift);
+    }
+    first += 64 * words;
+    to += 64 * words;
+    count -= 64 * words;
+    if (count > 0) {
+        copyPart(count);
     }
 }
 
