@@ -39,7 +39,7 @@ std::string_view nameOf(Fading fading)
 
 std::optional<Fading> fadingOf(std::string_view name)
 {
-    const auto found = std::find(names.begin(), names.end(), name);
+    const auto* const found = std::find(names.begin(), names.end(), name);
     return found == names.end() ? std::nullopt
                                 : std::optional(fadings[static_cast<std::size_t>(found - names.begin())]);
 }
