@@ -65,7 +65,8 @@ std::vector<ReceivedBlock> BlockSimulator::receivedBlocks() const
 {
     ReceivedBlock block;
     const auto K = static_cast<std::ptrdiff_t>(itsPoint.blockSize);
-    const auto length = static_cast<std::ptrdiff_t>(itsPoint.blockSize + rules::tailPositions);
+    const std::size_t positions = std::size_t{itsPoint.blockSize} + rules::tailPositions;
+    const auto length = static_cast<std::ptrdiff_t>(positions);
     for (unsigned s = 0; s < 3; ++s) {
         const auto first = itsFrames.streams[s].begin();
         block.streams[s].assign(first, first + length);

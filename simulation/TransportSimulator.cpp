@@ -100,7 +100,8 @@ std::vector<ReceivedBlock> TransportSimulator::receivedBlocks() const
 {
     std::vector<ReceivedBlock> blocks;
     for (const link::CodeBlockBatch& batch : itsBatches) {
-        const auto length = static_cast<std::ptrdiff_t>(batch.K + rules::tailPositions);
+        const std::size_t positions = std::size_t{batch.K} + rules::tailPositions;
+        const auto length = static_cast<std::ptrdiff_t>(positions);
         for (std::size_t i = 0; i < batch.places.size() && batch.places[i].frame == 0; ++i) {
             ReceivedBlock& block = blocks.emplace_back();
             for (unsigned s = 0; s < 3; ++s) {
