@@ -87,7 +87,7 @@ TEST_F(Reference, EveryFileOfErrorRatesHasATitle)
             ++files;
         }
     }
-    EXPECT_EQ(files, 6);
+    EXPECT_EQ(files, 8);
 }
 
 TEST_F(Reference, ReadsResultsOfARun)
