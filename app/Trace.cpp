@@ -94,10 +94,10 @@ void appendSignals(const std::string& text, std::vector<unsigned>& signals)
 /// The names that appendSignals() accepts.
 std::vector<std::string> signalWords()
 {
-    std::vector<std::string> words;
-    for (const Signal& signal : passSignals) {
-        words.emplace_back(signal.name);
-    }
+    std::vector<std::string> words(passSignals.size());
+    std::transform(passSignals.begin(), passSignals.end(), words.begin(), [](const Signal& signal) {
+        return std::string(signal.name);
+    });
     const std::vector<std::string> kinds = kindNames();
     words.insert(words.end(), kinds.begin(), kinds.end());
     return words;

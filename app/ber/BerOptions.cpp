@@ -289,7 +289,7 @@ void addExecutionOptions(CLI::App& command, BerOptions& options)
             [&options](const std::string& text) {
                 options.secondsBetweenCheckpoints = parseSeconds("--checkpoint-interval", text);
             },
-            "How much time's work a crash may cost at most, such as 10 or 5m")
+            "Time between checkpoints, the most that a crash may lose, such as 10 or 5m")
         ->type_name("T")
         ->default_str("3");
     CLI::Option* const resume =

@@ -16,8 +16,6 @@ namespace morvik {
 
 namespace {
 
-using simulation::LinkFormat;
-
 constexpr unsigned mostResourceElements = 168;
 
 // ---- Elements of the lists
@@ -91,10 +89,10 @@ void addChoice(CLI::App& command,
                NameOf textOf,
                const std::string& description)
 {
-    std::vector<std::string> words;
-    for (const Value each : values) {
-        words.emplace_back(textOf(each));
-    }
+    std::vector<std::string> words(std::size(values));
+    std::transform(std::begin(values), std::end(values), words.begin(), [&textOf](Value each) {
+        return std::string(textOf(each));
+    });
     const auto take = [=, &value](const std::string& text) {
         const auto found = std::find(words.begin(), words.end(), text);
         if (found == words.end()) {

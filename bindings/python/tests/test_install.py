@@ -16,7 +16,7 @@ assert numpy.array_equal(decoded.bits, bits)
 def test_pip_installs(repository, tmp_path):
     environment = {name: value for name, value in os.environ.items() if name != "PYTHONPATH"}
     # Compiling without optimisation takes half the time.
-    environment["CMAKE_ARGS"] = "-DCMAKE_BUILD_TYPE=Debug -DCMAKE_CXX_FLAGS_DEBUG=-O0"
+    environment["CMAKE_ARGS"] = "-DCMAKE_BUILD_TYPE="
 
     def run(*command):
         done = subprocess.run(
