@@ -25,7 +25,7 @@ constexpr std::size_t placeColumns = 8;  // of a row of CSV, before the signals
 /// The place of a stage's first signal among the signals of a row.
 constexpr std::ptrdiff_t firstOf(Stage stage)
 {
-    return signalsOf(stage).first;
+    return static_cast<std::ptrdiff_t>(signalsOf(stage).first);
 }
 
 std::vector<std::string> splitAt(char separator, const std::string& text)
