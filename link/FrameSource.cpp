@@ -45,6 +45,15 @@ void unpack(const std::uint64_t* block, unsigned K, std::uint8_t* bits)
 
 }  // namespace
 
+void Frames::resize(unsigned count, unsigned K)
+{
+    sent.resize(std::size_t{count} * K);
+    for (auto& stream : streams) {
+        stream.resize(std::size_t{count} * (K + rules::tailPositions));
+    }
+    clipped.resize(count);
+}
+
 FrameSource::FrameSource(
     unsigned K, int milliDecibels, double scale, std::uint64_t seed, Noise noise, const SamplerForm& form)
     : itsK(K),
@@ -63,11 +72,7 @@ FrameSource::FrameSource(
 
 void FrameSource::make(std::uint64_t first, unsigned count, Frames& frames)
 {
-    frames.sent.resize(std::size_t{count} * itsK);
-    for (auto& stream : frames.streams) {
-        stream.resize(std::size_t{count} * (itsK + rules::tailPositions));
-    }
-    frames.clipped.resize(count);
+    frames.resize(count, itsK);
     for (unsigned done = 0; done < count; done += TurboEncoder::blocksAtOnce) {
         const unsigned now = std::min(count - done, TurboEncoder::blocksAtOnce);
         drawInformation(first + done, now);

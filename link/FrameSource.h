@@ -20,6 +20,9 @@ struct Frames {
     std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic, parity 1, parity 2: K + 4 soft values of each
                                                       ///< frame, as include/morvik_v1_0_batch.h takes them
     std::vector<std::uint32_t> clipped;               ///< how many soft values of each frame were clipped
+
+    /// Makes room for `count` frames of K bits.
+    void resize(unsigned count, unsigned K);
 };
 
 /// How soft values are made.

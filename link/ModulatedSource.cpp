@@ -49,11 +49,7 @@ ModulatedSource::ModulatedSource(
 
 void ModulatedSource::make(std::uint64_t first, unsigned count, Frames& frames)
 {
-    frames.sent.resize(std::size_t{count} * itsK);
-    for (auto& stream : frames.streams) {
-        stream.resize(std::size_t{count} * (itsK + rules::tailPositions));
-    }
-    frames.clipped.resize(count);
+    frames.resize(count, itsK);
     for (unsigned done = 0; done < count; done += TurboEncoder::blocksAtOnce) {
         const unsigned now = std::min(count - done, TurboEncoder::blocksAtOnce);
         encode(first + done, now);
