@@ -36,11 +36,12 @@ RoundedDistribution coarseNoise()
 {
     // exp(-d^2 / 2 s^2) for s = 18: each is the one before times r^(2 d - 1) with r = exp(-1 / 2 s^2).
     constexpr double r = 0.99845798025952968374;
-    std::array<double, mostSteps + 1> densities{};
+    constexpr unsigned count = mostSteps + 1;
+    std::array<double, count> densities{};
     densities[0] = 1;
     double factor = r;
     double sum = 1;
-    for (unsigned d = 1; d <= mostSteps; ++d) {
+    for (unsigned d = 1; d < count; ++d) {
         densities[d] = densities[d - 1] * factor;
         factor *= r * r;
         sum += 2 * densities[d];

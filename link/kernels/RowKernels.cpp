@@ -114,7 +114,7 @@ using Numbers = float[chunk];
 struct Chunk {
     Numbers x;
     Numbers energy;
-    Numbers ratios[4];  ///< of each bit
+    float ratios[4][chunk];  ///< of each bit
 };
 
 void load(const DimensionRow& row, std::size_t first, std::size_t count, float slope, float energy, Chunk& to)
