@@ -57,7 +57,8 @@
 extern "C" {
 #endif
 
-/** What a function returns. Checks are made in the order of these numbers, and the first that fails is told. */
+/** What a function returns. Checks are made in the order of these numbers, MORVIK_LINK_BUFFER_SIZE
+ * last, and the first that fails is told. */
 enum {
     MORVIK_LINK_OK = 0,
     MORVIK_LINK_NULL_POINTER = 1,         /**< an array or record is null                                          */
@@ -162,8 +163,14 @@ MORVIK_LINK_API int32_t morvik_link_soft_buffer_size(uint32_t K,
 /** Rate recovery: adds received ratios to soft buffers, which are zeros before the first transmission. Repeated bits
  * are added one after the other in the order in which they were sent.
  *
- * @param ratios     `count` ratios of each block
- * @param buffers    soft buffers, as many values of each as morvik_link_soft_buffer_size tells
+ * @param K              block size
+ * @param fillers        filler bits at the start of each block (F)
+ * @param buffer_size    as in morvik_link_rate_match
+ * @param version        redundancy version, 0 to 3
+ * @param blocks         number of blocks
+ * @param ratios         `count` ratios of each
+ * @param count          bits that were sent of each block (E)
+ * @param buffers        soft buffers, as many values of each as morvik_link_soft_buffer_size tells
  */
 MORVIK_LINK_API int32_t morvik_link_rate_recover(uint32_t K,
                                                  uint32_t fillers,
@@ -189,11 +196,15 @@ MORVIK_LINK_API int32_t morvik_link_rate_recover_i16(uint32_t K,
 /** Puts values of soft buffers into the decoder's streams. Filler bits become `filler` in sys and par1, where they are
  * zeros that both sides know: -128 for the core. What was not sent and lies outside of the buffer becomes 0.
  *
- * @param buffers    soft buffers
- * @param filler     value of filler bits
- * @param sys        receives K + 4 values of each block
- * @param par1       likewise
- * @param par2       likewise
+ * @param K              block size
+ * @param fillers        filler bits at the start of each block (F)
+ * @param buffer_size    as in morvik_link_rate_match
+ * @param blocks         number of blocks
+ * @param buffers        their soft buffers
+ * @param filler         value of filler bits
+ * @param sys            receives K + 4 values of each block
+ * @param par1           likewise
+ * @param par2           likewise
  */
 MORVIK_LINK_API int32_t morvik_link_deinterleave(uint32_t K,
                                                  uint32_t fillers,
@@ -218,9 +229,10 @@ MORVIK_LINK_API int32_t morvik_link_deinterleave_i8(uint32_t K,
 
 /** The core's input: ratios times scale, rounded with halves away from 0, clipped to -128 ... 127. Eight steps are 1.
  *
- * @param ratios    `count` ratios
+ * @param ratios    the ratios
+ * @param count     how many there are
  * @param scale     steps for a ratio of 1, above 0
- * @param values    receives `count` soft values
+ * @param values    receives a soft value of each
  */
 MORVIK_LINK_API int32_t morvik_link_soft_values(const float* ratios, size_t count, float scale, int8_t* values);
 
@@ -240,7 +252,7 @@ morvik_link_soft_values_i16(const float* ratios, size_t count, float scale, uint
  */
 MORVIK_LINK_API int32_t morvik_link_map(uint32_t bits_per_symbol, const uint8_t* bits, size_t count, float* symbols);
 
-/** Demappers: the nearest points alone, which is quick; or all points, which is exact to 1e-6. */
+/** Demappers: the nearest points alone, which is quick; or all points, exact but for the rounding of floats. */
 enum { MORVIK_LINK_MAX_LOG = 0, MORVIK_LINK_EXACT = 1 };
 
 /** The log-likelihood ratios of received symbols: gain * symbol + noise.
@@ -294,8 +306,9 @@ typedef struct morvik_link_places {
     uint32_t buffer_at;   /**< the first of them                                         */
 } morvik_link_places;
 
-/** @param r         number of a code block, from 0 on
- *  @param places    receives its places */
+/** @param transport    as made
+ *  @param r            number of a code block, from 0 on
+ *  @param places       receives its places */
 MORVIK_LINK_API int32_t morvik_link_transport_code_block(const morvik_link_transport* transport,
                                                          uint32_t r,
                                                          morvik_link_places* places);
@@ -305,18 +318,22 @@ MORVIK_LINK_API uint32_t morvik_link_transport_buffer_size(const morvik_link_tra
 
 /** Encodes transport blocks: the coded bits of one transmission of each.
  *
- * @param version    redundancy version, 0 to 3
- * @param blocks     number of transport blocks
- * @param bits       transport_block_size bits of each
- * @param coded      receives coded_bits bits of each
+ * @param transport    as made
+ * @param version      redundancy version, 0 to 3
+ * @param blocks       number of transport blocks
+ * @param bits         transport_block_size bits of each
+ * @param coded        receives coded_bits bits of each
  */
 MORVIK_LINK_API int32_t morvik_link_transport_encode(
     morvik_link_transport* transport, uint32_t version, size_t blocks, const uint8_t* bits, uint8_t* coded);
 
 /** Adds a transmission to soft buffers, which are zeros before the first one.
  *
- * @param ratios     coded_bits ratios of each transport block
- * @param buffers    their soft buffers
+ * @param transport    as made
+ * @param version      redundancy version, 0 to 3
+ * @param blocks       number of transport blocks
+ * @param ratios       coded_bits ratios of each
+ * @param buffers      their soft buffers
  */
 MORVIK_LINK_API int32_t morvik_link_transport_recover(
     const morvik_link_transport* transport, uint32_t version, size_t blocks, const float* ratios, float* buffers);
@@ -332,11 +349,14 @@ MORVIK_LINK_API int32_t morvik_link_transport_recover_i16(const morvik_link_tran
 /** Code block r of each transport block as the core takes it: the soft buffer, scaled, rounded, clipped and put into
  * streams, filler bits as -128.
  *
- * @param buffers    soft buffers of the transport blocks
- * @param scale      steps for a ratio of 1, above 0
- * @param sys        receives K + 4 values of each transport block, K being the size of code block r
- * @param par1       likewise
- * @param par2       likewise
+ * @param transport    as made
+ * @param r            number of the code block, from 0 on
+ * @param blocks       number of transport blocks
+ * @param buffers      their soft buffers
+ * @param scale        steps for a ratio of 1, above 0
+ * @param sys          receives K + 4 values of each transport block, K being the size of code block r
+ * @param par1         likewise
+ * @param par2         likewise
  */
 MORVIK_LINK_API int32_t morvik_link_transport_soft_values(const morvik_link_transport* transport,
                                                           uint32_t r,
@@ -358,6 +378,9 @@ MORVIK_LINK_API int32_t morvik_link_transport_soft_values_i16(const morvik_link_
 
 /** Puts decisions on code block r of each transport block into the transport blocks.
  *
+ * @param transport    as made
+ * @param r            number of the code block, from 0 on
+ * @param blocks       number of transport blocks
  * @param decisions    K decisions of each
  * @param bits         transport_block_size + 24 bits of each: those that code block r carries are written
  * @param fits         receives 1 for each code block whose CRC fits, or 0: its own CRC where there are several, else
@@ -372,8 +395,10 @@ MORVIK_LINK_API int32_t morvik_link_transport_join(const morvik_link_transport* 
 
 /** Checks the CRC of transport blocks.
  *
- * @param bits    transport_block_size + 24 bits of each
- * @param fits    receives 1 for each transport block whose CRC fits, or 0
+ * @param transport    as made
+ * @param blocks       number of transport blocks
+ * @param bits         transport_block_size + 24 bits of each
+ * @param fits         receives 1 for each transport block whose CRC fits, or 0
  */
 MORVIK_LINK_API int32_t morvik_link_transport_check(const morvik_link_transport* transport,
                                                     size_t blocks,
