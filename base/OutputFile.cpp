@@ -275,7 +275,10 @@ void expectOwnFile(const std::string& name, const std::vector<std::string>& inpu
 bool isSamePlace(const std::string& a, const std::string& b)
 {
     const auto whole = [](const std::string& name) {
-        return std::filesystem::weakly_canonical(std::filesystem::absolute(placeOf(name).path));
+        const std::filesystem::path path = std::filesystem::absolute(placeOf(name).path);
+        std::error_code failed;  // a pipe behind /dev/stdout has no path
+        const std::filesystem::path canonical = std::filesystem::weakly_canonical(path, failed);
+        return failed ? path : canonical;
     };
     return whole(a) == whole(b);
 }

@@ -157,7 +157,7 @@ Example: the waterfall of 512 bits after four and after eight iterations
   morvik ber --block-size 512 --iterations 4,8 --output k512.csv
 
 Example: the throughput of each MCS
-  morvik ber --mcs 0:28 --resource-blocks 6 --plot mcs.svg)";
+  morvik ber --mcs 0:28 --resource-blocks 6 --resource-elements 138 --plot mcs.svg)";
 
 }  // namespace
 

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <limits>
 
 #include "SoftValueReader.h"
 #include "base/Numbers.h"
@@ -62,12 +63,12 @@ void CodedValueReader::readRow()
     itsValues.resize(found);
     for (std::size_t i = 0; i < found; ++i) {
         const std::string_view field = itsRow.fields()[i + 1];
-        const auto value = base::parseNumber<float>(field);
-        if (!value || !std::isfinite(*value)) {
+        const auto value = base::parseNumber<double>(field);
+        if (!value || !(std::abs(*value) <= static_cast<double>(std::numeric_limits<float>::max()))) {
             itsLines.fail("column " + std::to_string(i + 2) + ": " + base::shown(field) +
                           " is not allowed, expected a finite number");
         }
-        itsValues[i] = *value;
+        itsValues[i] = static_cast<float>(*value);
     }
 }
 

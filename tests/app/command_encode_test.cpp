@@ -246,6 +246,8 @@ TEST_F(TransportBlocksTest, OfWrongFormAreRefused)
                    "in.csv:2: column 3: \"" + std::string(value) + "\" is not allowed, expected a finite number\n");
     }
     expectText(top + "\n0" + zeros, "in.csv:2: blank line before the end\n");
+    morvik.write("in.csv", top + "0,1e-60" + zeros.substr(2));
+    EXPECT_EQ(morvik.run(decode).status, 1) << "a number too small for a float is 0, and the CRC fails";
     morvik.write("in.csv", top + "0" + zeros + "0" + zeros);
     EXPECT_EQ(morvik.run(decode).err,
               start + "in.csv:3: block 0 has more rows than --redundancy-version has numbers, 1\n");

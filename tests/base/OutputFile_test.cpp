@@ -156,6 +156,17 @@ TEST_F(OutputFile, IsTheSamePlaceUnderAllOfItsNames)
     }
 }
 
+TEST_F(OutputFile, ComparesThePlaceOfAPipe)
+{
+    int ends[2] = {};
+    ASSERT_EQ(pipe(ends), 0);
+    const std::string inlet = "/dev/fd/" + std::to_string(ends[1]);
+    EXPECT_TRUE(isSamePlace(inlet, inlet));
+    EXPECT_FALSE(isSamePlace(inlet, file));
+    close(ends[0]);
+    close(ends[1]);
+}
+
 TEST_F(OutputFile, LeavesFilesOfOtherNamesAlone)
 {
     folder.write("file.csv.unfinished", "the user's own");
