@@ -41,7 +41,7 @@ def check_content(page, help_text):
     if not any("--help" in names for names, _ in arguments):
         failures.append(f"{page.name}: --help has another form than this test expects")
     for names, description in arguments:
-        names = re.findall(r"--?[a-z][a-z0-9-]*", re.split(r"Needs:|Excludes:", names)[0]) or [names.split()[0]]
+        names = re.findall(r"(?<![\w-])--?[a-z][a-z0-9-]*", re.split(r"Needs:|Excludes:", names)[0]) or [names.split()[0]]
         names = re.sub("=.*", "", ", ".join(names))
         if not re.search(rf"{re.escape(names.lower())}( \S+)? {re.escape(words_of(description))}\.", text):
             failures.append(f"{page.name}: lacks {names}: {description}")
