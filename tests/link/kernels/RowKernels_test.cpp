@@ -43,7 +43,7 @@ std::vector<Integer> randomIntegers(Random& random, std::size_t count)
 template <typename Value>
 bool areSame(const std::vector<Value>& a, const std::vector<Value>& b)
 {
-    return a.size() == b.size() && std::memcmp(a.data(), b.data(), a.size() * sizeof(Value)) == 0;
+    return a.size() == b.size() && (a.empty() || std::memcmp(a.data(), b.data(), a.size() * sizeof(Value)) == 0);
 }
 
 /// Calls `compute` with each set; all must return the same.
