@@ -63,10 +63,11 @@ void checkTogether(const LinkOptions& options, bool hasBlockSize)
                "--mcs sets what --coded-bits, --code-rate and --modulation do: they cannot be given with it");
         expect(options.resourceBlocks.has_value(),
                "--mcs needs --resource-blocks, 1 to " + std::to_string(link::mostResourceBlocks));
-        const unsigned last = countOf(options.mcsTable.value_or(link::McsTable::qam64)) - 1;
+        const link::McsTable table = options.mcsTable.value_or(link::McsTable::qam64);
+        const unsigned last = countOf(table) - 1;
         expect(options.mcsIndices.back() <= last,
                "--mcs " + std::to_string(options.mcsIndices.back()) + " is not in --mcs-table " +
-                   std::string(simulation::nameOf(*options.mcsTable)) + ", expected 0 to " + std::to_string(last));
+                   std::string(simulation::nameOf(table)) + ", expected 0 to " + std::to_string(last));
     }
 }
 
