@@ -99,6 +99,23 @@ std::string codedLine(const Options& options, unsigned block, const std::uint64_
     return line + '\n';
 }
 
+/// The code of transport blocks of a size, kept in `codes` from the first of them on.
+link::TransportBlockCode& codeFor(unsigned size,
+                                  const Options& options,
+                                  const BitLines& lines,
+                                  std::map<unsigned, link::TransportBlockCode>& codes)
+{
+    const auto known = codes.find(size);
+    if (known != codes.end()) {
+        return known->second;
+    }
+    try {
+        return codes.emplace(size, transportBlockCode(size, options.transport)).first->second;
+    } catch (const base::Error& error) {
+        lines.fail(error.what());
+    }
+}
+
 /// Writes the coded bits of each transport block, a line for each transmission.
 void encodeTransportBlocks(const Options& options, BitLines& lines, base::OutputFile& output)
 {
@@ -110,15 +127,7 @@ void encodeTransportBlocks(const Options& options, BitLines& lines, base::Output
     }
     for (unsigned block = 0; lines.next(); ++block) {
         const auto size = static_cast<unsigned>(lines.text().size());
-        auto known = codes.find(size);
-        if (known == codes.end()) {
-            try {
-                known = codes.emplace(size, transportBlockCode(size, options.transport)).first;
-            } catch (const base::Error& error) {
-                lines.fail(error.what());
-            }
-        }
-        link::TransportBlockCode& code = known->second;
+        link::TransportBlockCode& code = codeFor(size, options, lines, codes);
         code.encode(packed(bitsOf(lines.text()), link::wordsOf(size)), 1, buffers);
         for (const unsigned version : options.transport.versions) {
             code.select(buffers, 1, version, coded);
