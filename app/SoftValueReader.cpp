@@ -13,21 +13,21 @@
 
 namespace morvik {
 
-bool isLabel(std::string_view text)
+std::string_view labelOf(const base::LineReader& lines, const base::CsvReader& row)
 {
-    return !text.empty() && std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+    const std::string_view label = row.fields().front();
+    const bool isLabel =
+        !label.empty() && std::all_of(label.begin(), label.end(), [](char c) { return c >= '0' && c <= '9'; });
+    if (!isLabel) {
+        lines.fail("block " + base::shown(label) + " is not a label, expected a non-negative integer");
+    }
+    return label;
 }
 
 SoftValueReader::SoftValueReader(std::istream& input, const std::string& name)
     : itsLines(input, name, base::LineReader::shortLines)
 {
-    const std::string header = base::shown(softValueHeader);
-    if (!itsRow.next()) {
-        itsLines.fail("no header, expected " + header);
-    }
-    if (!itsRow.is(softValueHeader)) {
-        itsLines.fail("wrong header " + base::shown(itsLines.text()) + ", expected " + header);
-    }
+    itsRow.expectHeader(softValueHeader);
     advance();
     if (itsAtEnd && !itsMistake) {
         itsLines.failAt(itsLines.number() + 1, "no rows after the header, expected at least one block");
@@ -85,10 +85,7 @@ void SoftValueReader::readLabel()
         itsAtEnd = true;
         return;
     }
-    itsLabel = itsRow.fields().front();
-    if (!isLabel(itsLabel)) {
-        itsLines.fail("block " + base::shown(itsLabel) + " is not a label, expected a non-negative integer");
-    }
+    itsLabel = labelOf(itsLines, itsRow);
 }
 
 void SoftValueReader::appendRow(SoftBlock& block) const

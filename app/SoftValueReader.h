@@ -22,8 +22,9 @@ constexpr char softValueHeader[] = "block,rsc1_sys,rsc1_par,rsc2_par";
 /// The allowed numbers of rows in a block, for messages.
 constexpr char allowedRows[] = "K + 4 rows, where K is a block size of 3GPP TS 36.212 (40 to 6144)";
 
-/// Whether the text is a block's label: a non-negative integer of any length.
-bool isLabel(std::string_view text);
+/// The label of a row's block, its first field: a non-negative integer of any length. Throws Error, naming the line, if
+/// it is none.
+std::string_view labelOf(const base::LineReader& lines, const base::CsvReader& row);
 
 /// Reads one block at a time.
 ///

@@ -2,7 +2,9 @@
 #include "Csv.h"
 
 #include <algorithm>
+#include <string>
 
+#include "Shown.h"
 #include "Text.h"
 
 namespace morvik::base {
@@ -45,6 +47,16 @@ void CsvReader::takeLine()
 bool CsvReader::is(std::string_view line) const
 {
     return itsFields == fieldsOf(line);
+}
+
+void CsvReader::expectHeader(std::string_view header)
+{
+    if (!next()) {
+        itsLines.fail("no header, expected " + shown(header));
+    }
+    if (!is(header)) {
+        itsLines.fail("wrong header " + shown(itsLines.text()) + ", expected " + shown(header));
+    }
 }
 
 std::optional<std::size_t> CsvReader::find(std::string_view text) const

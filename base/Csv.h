@@ -35,6 +35,9 @@ public:
     /// Whether the row has exactly the fields of `line`; for checking headers.
     bool is(std::string_view line) const;
 
+    /// Goes to the next line, which has to be `header`. Throws Error, naming the line, if it is not.
+    void expectHeader(std::string_view header);
+
     /// The index of the first field that equals `text`.
     std::optional<std::size_t> find(std::string_view text) const;
 

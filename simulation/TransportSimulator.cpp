@@ -67,22 +67,8 @@ void TransportSimulator::simulate(std::uint64_t first, std::uint32_t count, Batc
     std::vector<unsigned> open(count);
     std::iota(open.begin(), open.end(), 0U);
     if (itsPlan.eachIteration) {
-        // One transmission; each number of iterations decodes anew.
         transmit(open, 0, clipped);
-        std::vector<BatchResult> results(itsPoint.iterations);
-        for (unsigned i = 0; i < itsPoint.iterations; ++i) {
-            decode(open, i + 1);
-            append(results[i]);
-            for (Frame& frame : itsFrames) {
-                frame.reception.iterations = 0;
-            }
-        }
-        for (std::uint32_t frame = 0; frame < count; ++frame) {
-            for (const BatchResult& each : results) {
-                result.wrongBits.push_back(each.wrongBits[frame]);
-                result.receptions.push_back(each.receptions[frame]);
-            }
-        }
+        decodeEachIteration(open, result);
     } else {
         for (unsigned t = 0; t < itsPoint.link.versions.size() && !open.empty(); ++t) {
             transmit(open, t, clipped);
@@ -121,6 +107,25 @@ void TransportSimulator::transmit(const std::vector<unsigned>& frames,
     itsSource.transmit(frames, transmission, itsBatches, clipped.data());
     for (const unsigned frame : frames) {
         itsFrames[frame].reception.transmissions += 1;
+    }
+}
+
+/// Decodes all frames, which have had one transmission, with each number of iterations anew.
+void TransportSimulator::decodeEachIteration(const std::vector<unsigned>& frames, BatchResult& result)
+{
+    std::vector<BatchResult> results(itsPoint.iterations);
+    for (unsigned i = 0; i < itsPoint.iterations; ++i) {
+        decode(frames, i + 1);
+        append(results[i]);
+        for (Frame& frame : itsFrames) {
+            frame.reception.iterations = 0;
+        }
+    }
+    for (const unsigned frame : frames) {
+        for (const BatchResult& each : results) {
+            result.wrongBits.push_back(each.wrongBits[frame]);
+            result.receptions.push_back(each.receptions[frame]);
+        }
     }
 }
 

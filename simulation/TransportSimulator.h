@@ -31,6 +31,7 @@ private:
 
     void transmit(const std::vector<unsigned>& frames, unsigned transmission, std::vector<std::uint32_t>& clipped);
     void decode(const std::vector<unsigned>& frames, unsigned iterations);
+    void decodeEachIteration(const std::vector<unsigned>& frames, BatchResult& result);
     Core& coreOf(const link::CodeBlockBatch& batch);
     void decodeBatch(const link::CodeBlockBatch& batch, unsigned iterations);
     void decodeUntilItFits(const link::CodeBlockBatch& batch, unsigned iterations);

@@ -27,13 +27,7 @@ std::size_t longestRow(std::uint32_t codedBits)
 CodedValueReader::CodedValueReader(std::istream& input, const std::string& name, std::uint32_t codedBits)
     : itsLines(input, name, longestRow(codedBits)), itsCodedBits(codedBits)
 {
-    const std::string header = base::shown(codedValueHeader);
-    if (!itsRow.next()) {
-        itsLines.fail("no header, expected " + header);
-    }
-    if (!itsRow.is(codedValueHeader)) {
-        itsLines.fail("wrong header " + base::shown(itsLines.text()) + ", expected " + header);
-    }
+    itsRow.expectHeader(codedValueHeader);
 }
 
 bool CodedValueReader::next()
@@ -51,10 +45,7 @@ bool CodedValueReader::next()
 
 void CodedValueReader::readRow()
 {
-    itsLabel = itsRow.fields().front();
-    if (!isLabel(itsLabel)) {
-        itsLines.fail("block " + base::shown(itsLabel) + " is not a label, expected a non-negative integer");
-    }
+    itsLabel = labelOf(itsLines, itsRow);
     const std::size_t found = itsRow.fields().size() - 1;
     if (found != itsCodedBits) {
         itsLines.fail(base::counted(found, "value") + ", expected the " + std::to_string(itsCodedBits) +
