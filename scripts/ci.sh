@@ -210,9 +210,12 @@ scripts/setup --checks --tests
 [ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads hostile coverage tests
 for stage in "$@"; do
     if ! declare -F "stage_$stage" >/dev/null; then
-        echo "ci.sh: no stage '$stage'; stages are format lint lint-tests docs compilers abi memory threads hostile coverage tests abi-renew mutate packages starts memory-short lint-short" >&2
+        stages=$(declare -F | sed -n 's/^declare -f stage_//p')
+        echo "ci.sh: no stage '$stage'; stages are "$stages >&2
         exit 2
     fi
     echo "== $stage"
+    begun=$SECONDS
     "stage_$stage"
+    echo "== $stage: $((SECONDS - begun)) s"
 done
