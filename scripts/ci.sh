@@ -37,13 +37,12 @@ tidy() {
     scripts/build x86_64
     # Standard error has the number of suppressed warnings, and the reason if it could not run.
     local log=build/x86_64/lint.log
-    # Removes what is g++'s own from the commands: flags, and precompiled headers.
-    mkdir -p build/lint
-    sed -E 's/ -fno-tree-[a-z]*//g; s/ -Winvalid-pch -include [^ ]*cmake_pch.hxx//' build/x86_64/compile_commands.json >build/lint/compile_commands.json
     # A unit of bench/ needs a package that is not installed here, and Octave's own compiler builds its functions.
     git ls-files "$@" |
         grep -vxE 'bench/ItppDecoding\.cpp|bindings/octave/.*' |
-        xargs -P "$(nproc)" -n 4 clang-tidy -p build/lint --quiet "${analyzer[@]}" 2>"$log" || { cat "$log" >&2; return 1; }
+        xargs scripts/lint-units build/x86_64 build/lint |
+        xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet --checks=-bugprone-suspicious-include "${analyzer[@]}" \
+            2>"$log" || { cat "$log" >&2; return 1; }
 }
 
 # The documents' site, warnings as errors. A separate test runs their code blocks.
