@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "link/coding/PackedBits.h"
 #include "link/kernels/RowKernels.h"
 #include "link/modulation/Mapper.h"
 
@@ -55,6 +56,21 @@ void SymbolLink::receive(
                      itsChannel.noiseVariance(),
                      now,
                      ratios + first * perSymbol);
+    }
+}
+
+void transmitRows(const SymbolFormat& format,
+                  std::uint64_t seed,
+                  const std::uint8_t* bits,
+                  std::size_t rows,
+                  std::size_t count,
+                  float* ratios)
+{
+    SymbolLink link(format, randomKey(seed), samplerForms().front());
+    std::vector<std::uint64_t> packed(wordsOf(count));
+    for (std::size_t row = 0; row < rows; ++row) {
+        packBits(bits + row * count, count, packed.data());
+        link.receive(row, 0, packed.data(), count, ratios + row * count);
     }
 }
 

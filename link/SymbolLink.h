@@ -43,6 +43,14 @@ private:
     std::vector<float> itsGains;
 };
 
+/// The ratios of rows of `count` bits, each a byte of 0 or 1. A row is a frame of a simulation with this seed.
+void transmitRows(const SymbolFormat& format,
+                  std::uint64_t seed,
+                  const std::uint8_t* bits,
+                  std::size_t rows,
+                  std::size_t count,
+                  float* ratios);
+
 }  // namespace morvik::link
 
 #endif

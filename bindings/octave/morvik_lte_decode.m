@@ -3,7 +3,8 @@
 %   [bits, fits, code_blocks_fit] = morvik_lte_decode(buffers, transport_block_size, coded_bits, modulation, ...
 %                                                     option, value, ...)
 %
-% buffers                 as from morvik_lte_recover, a transport block in each column
+% buffers                 as from morvik_lte_recover, a transport block in each column. Those of whole steps, int16, are
+%                         only clipped
 % transport_block_size    bits of a transport block (A)
 % coded_bits              bits of one transmission (G)
 % modulation              as for morvik_lte_encode
@@ -12,13 +13,13 @@
 % code_blocks_fit         whether the CRC of each code block fits: logical, a row for each code block
 %
 % Options:
-%   'scale'    steps of a soft value for a ratio of 1; [] suits modulation, code rate and algorithm (default)
+%   'scale'    steps of a soft value for a ratio of 1; [] is that of morvik_lte_scale (default)
 %   'num_pu', 'algorithm', 'iterations'    as for morvik_decode
 %   'layers', 'soft_buffer_size'           as for morvik_lte_encode
 %
 % Errors:   morvik:badCall, morvik:badClass, morvik:badSize, morvik:badValue, morvik:badOption
 %
-% See also morvik_lte_recover, morvik_decode.
+% See also morvik_lte_recover, morvik_lte_streams, morvik_decode.
 function [bits, fits, code_blocks_fit] = morvik_lte_decode(buffers, transport_block_size, coded_bits, modulation, varargin)
     caller = 'morvik_lte_decode';
     if nargin < 4
@@ -26,20 +27,16 @@ function [bits, fits, code_blocks_fit] = morvik_lte_decode(buffers, transport_bl
     end
     [format, options] = morvik_lte_format(caller, transport_block_size, coded_bits, modulation, ...
         struct('scale', [], 'num_pu', 2, 'algorithm', 'scaled', 'iterations', 8), varargin);
-    rows = morvik_lte_call(caller, 'transport_buffer', format);
-    buffers = morvik_lte_buffers(caller, buffers, rows, size(buffers, 2));
-    if isempty(options.scale)
-        algorithm = morvik_lte_choice(caller, 'algorithm', options.algorithm, {'max-log', 'scaled', 'table'}) - 1;
-        rate = transport_block_size / coded_bits;
-        options.scale = morvik_lte_call(caller, 'ratio_scale', algorithm, morvik_lte_modulation(caller, modulation), rate);
-    end
-    scale = morvik_lte_positive(caller, 'scale', options.scale);
+    streams = morvik_lte_values(caller, format, buffers, modulation, options.scale, options.algorithm);
     blocks = morvik_lte_segment(transport_block_size);
     decisions = cell(1, blocks.count);
-    for r = 1:numel(decisions)
-        [sys, par1, par2] = morvik_lte_call(caller, 'block_values', format, r - 1, buffers, scale);
-        decisions{r} = morvik_decode(sys, par1, par2, 'num_pu', options.num_pu, 'algorithm', options.algorithm, ...
-            'iterations', options.iterations);
+    for alike = {1:blocks.count_minus, blocks.count_minus + 1:blocks.count}  % those of one size in one call
+        if ~isempty(alike{1})
+            decided = morvik_decode([streams{alike{1}, 1}], [streams{alike{1}, 2}], [streams{alike{1}, 3}], ...
+                'num_pu', options.num_pu, 'algorithm', options.algorithm, 'iterations', options.iterations);
+            columns = repmat(size(buffers, 2), 1, numel(alike{1}));
+            decisions(alike{1}) = mat2cell(decided, size(decided, 1), columns);
+        end
     end
     [bits, fits, code_blocks_fit] = morvik_lte_call(caller, 'join', format, decisions);
 end

@@ -2,9 +2,10 @@
 %
 %   [sys, par1, par2] = morvik_lte_deinterleave(buffers, K, option, value, ...)
 %
-% buffers            soft buffers as from morvik_lte_rate_recover, or what was made of them, a block in each column
+% buffers            soft buffers as from morvik_lte_rate_recover, or the int8 that morvik_lte_soft_values makes of them, a
+%                    block in each column
 % K                  block size
-% sys, par1, par2    single, K + 4 rows. What was not sent and lies outside of the buffer is 0.
+% sys, par1, par2    int8 or single, as the buffers are, K + 4 rows. What was not sent and lies outside of the buffer is 0.
 %
 % Options:
 %   'filler'         the value of filler bits in sys and par1 (default -128, the core's strongest 0)
@@ -18,8 +19,19 @@ function [sys, par1, par2] = morvik_lte_deinterleave(buffers, K, varargin)
     if nargin < 2
         error('morvik:badCall', '%s: needs soft buffers and the block size', caller);
     end
-    [matching, ~, filler] = morvik_lte_matching(caller, K, varargin);
+    [matching, options] = morvik_lte_matching(caller, K, struct('filler', -128), varargin);
+    if isa(buffers, 'int8')
+        filler = morvik_lte_number(caller, 'filler', options.filler, -128, 127);
+    else
+        buffers = morvik_lte_ratios(caller, 'buffers', buffers);
+        filler = double(morvik_lte_ratios(caller, 'filler', options.filler));
+        if ~isscalar(filler)
+            error('morvik:badSize', '%s: filler has to be one number', caller);
+        end
+    end
     rows = morvik_lte_call(caller, 'buffer_size', matching);
-    buffers = morvik_lte_buffers(caller, buffers, rows, size(buffers, 2));
+    if size(buffers, 1) ~= rows || ndims(buffers) > 2
+        error('morvik:badSize', '%s: buffers have to be of %d rows, not %d', caller, rows, size(buffers, 1));
+    end
     [sys, par1, par2] = morvik_lte_call(caller, 'deinterleave', matching, buffers, filler);
 end

@@ -25,6 +25,6 @@ function coded = morvik_lte_encode(bits, coded_bits, modulation, varargin)
         error('morvik:badCall', '%s: needs bits, the number of coded bits and the modulation', caller);
     end
     bits = morvik_lte_bits(caller, 'bits', bits);
-    [format, options] = morvik_lte_format(caller, size(bits, 1), coded_bits, modulation, struct(), varargin);
+    [format, options] = morvik_lte_format(caller, size(bits, 1), coded_bits, modulation, struct('version', 0), varargin);
     coded = morvik_lte_call(caller, 'encode', format, options.version, bits);
 end

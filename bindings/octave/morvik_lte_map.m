@@ -15,10 +15,7 @@ function symbols = morvik_lte_map(bits, modulation)
         error('morvik:badCall', '%s: needs bits and the modulation', caller);
     end
     count = morvik_lte_modulation(caller, modulation);
-    bits = morvik_lte_bits(caller, 'bits', bits);
-    if mod(size(bits, 1), count) ~= 0
-        error('morvik:badSize', '%s: %d rows of bits are no multiple of the %d of a symbol', caller, size(bits, 1), count);
-    end
+    bits = morvik_lte_symbols(caller, bits, count);
     symbols = morvik_lte_call(caller, 'map', count, bits);
     if count > 1
         symbols = complex(symbols(1:2:end, :), symbols(2:2:end, :));

@@ -4,8 +4,9 @@
 //     [status, text, ...] = morvik_lte_mex(command, ...)
 //
 // A block is a column. The callers have checked classes and sizes: bits are logical, ratios, symbols, soft buffers and
-// gains single, all numbers whole and within 32 bits where they count something. They also raise errors, from the
-// status of the C interface: an interpreter's functions for it would leave without destroying anything.
+// gains single, whole steps and their soft buffers int16, all numbers whole and within 32 bits where they count
+// something. They also raise errors, from the status of the C interface: an interpreter's functions for it would leave
+// without destroying anything.
 #include <mex.h>
 
 #include <algorithm>
@@ -18,12 +19,14 @@
 #include <vector>
 
 #include "link/RatioScale.h"
+#include "link/SymbolLink.h"
 #include "morvik_link.h"
 
 namespace {
 
 constexpr std::size_t tailPositions = 4;
 constexpr std::size_t parityBits = 24;
+constexpr std::uint32_t coreWidth = 8;
 
 /// The elements; of an empty array, a place that nobody looks at, as the library wants no null pointers.
 template <class Value>
@@ -58,6 +61,18 @@ mxArray* logicalMatrix(std::size_t rows, std::size_t columns)
 mxArray* numericMatrix(std::size_t rows, std::size_t columns, mxClassID type)
 {
     return mxCreateNumericMatrix(static_cast<mwSize>(rows), static_cast<mwSize>(columns), type, mxREAL);
+}
+
+/// Whether these are whole steps, not ratios.
+bool areSteps(const mxArray* values)
+{
+    return mxGetClassID(values) == mxINT16_CLASS;
+}
+
+/// What earlier transmissions left, or zeros, of the class of what is added to them.
+mxArray* buffersBefore(const mxArray* left, std::size_t size, const mxArray* added)
+{
+    return mxIsEmpty(left) ? numericMatrix(size, mxGetN(added), mxGetClassID(added)) : mxDuplicateArray(left);
 }
 
 using Results = mxArray**;
@@ -122,23 +137,36 @@ std::int32_t rateMatch(Results results, Arguments arguments)
                                   bits(results[0]));
 }
 
-/// matching, ratios, soft buffers or nothing -> soft buffers
+/// matching, ratios or steps, soft buffers or nothing, width of steps -> soft buffers
 std::int32_t rateRecover(Results results, Arguments arguments)
 {
     const Matching of(arguments[0]);
-    const std::size_t blocks = mxGetN(arguments[1]);
+    const mxArray* const received = arguments[1];
+    const std::size_t blocks = mxGetN(received);
+    const std::size_t count = mxGetM(received);
     std::uint32_t size = 0;
     const std::int32_t status = morvik_link_soft_buffer_size(of.K, of.fillers, of.size, &size);
-    results[0] = mxIsEmpty(arguments[2]) ? numericMatrix(size, blocks, mxSINGLE_CLASS) : mxDuplicateArray(arguments[2]);
-    return status != MORVIK_LINK_OK ? status
-                                    : morvik_link_rate_recover(of.K,
-                                                               of.fillers,
-                                                               of.size,
-                                                               of.version,
-                                                               blocks,
-                                                               data<const float>(arguments[1]),
-                                                               mxGetM(arguments[1]),
-                                                               data<float>(results[0]));
+    results[0] = buffersBefore(arguments[2], size, received);
+    if (status != MORVIK_LINK_OK) {
+        return status;
+    }
+    return areSteps(received) ? morvik_link_rate_recover_i16(of.K,
+                                                             of.fillers,
+                                                             of.size,
+                                                             of.version,
+                                                             blocks,
+                                                             data<const std::int16_t>(received),
+                                                             count,
+                                                             whole(arguments[3]),
+                                                             data<std::int16_t>(results[0]))
+                              : morvik_link_rate_recover(of.K,
+                                                         of.fillers,
+                                                         of.size,
+                                                         of.version,
+                                                         blocks,
+                                                         data<const float>(received),
+                                                         count,
+                                                         data<float>(results[0]));
 }
 
 /// matching -> values of a soft buffer
@@ -151,33 +179,44 @@ std::int32_t bufferSize(Results results, Arguments arguments)
     return status;
 }
 
-/// matching, soft buffers, filler -> sys, par1, par2
-std::int32_t deinterleave(Results results, Arguments arguments)
+template <class Value, class Function>
+std::int32_t deinterleaveBy(Function function, Results results, Arguments arguments)
 {
     const Matching of(arguments[0]);
     const std::size_t blocks = mxGetN(arguments[1]);
     for (std::size_t s = 0; s < 3; ++s) {
-        results[s] = numericMatrix(of.K + tailPositions, blocks, mxSINGLE_CLASS);
+        results[s] = numericMatrix(of.K + tailPositions, blocks, mxGetClassID(arguments[1]));
     }
-    return morvik_link_deinterleave(of.K,
-                                    of.fillers,
-                                    of.size,
-                                    blocks,
-                                    data<const float>(arguments[1]),
-                                    real(arguments[2]),
-                                    data<float>(results[0]),
-                                    data<float>(results[1]),
-                                    data<float>(results[2]));
+    return function(of.K,
+                    of.fillers,
+                    of.size,
+                    blocks,
+                    data<const Value>(arguments[1]),
+                    static_cast<Value>(*data<const double>(arguments[2])),
+                    data<Value>(results[0]),
+                    data<Value>(results[1]),
+                    data<Value>(results[2]));
 }
 
-/// ratios, scale -> soft values
+/// matching, soft buffers or their soft values, filler -> sys, par1, par2 of the same class
+std::int32_t deinterleave(Results results, Arguments arguments)
+{
+    return mxGetClassID(arguments[1]) == mxINT8_CLASS
+               ? deinterleaveBy<std::int8_t>(morvik_link_deinterleave_i8, results, arguments)
+               : deinterleaveBy<float>(morvik_link_deinterleave, results, arguments);
+}
+
+/// ratios, scale, width -> soft values of the core where width is 8, else steps
 std::int32_t softValues(Results results, Arguments arguments)
 {
-    results[0] = numericMatrix(mxGetM(arguments[0]), mxGetN(arguments[0]), mxINT8_CLASS);
-    return morvik_link_soft_values(data<const float>(arguments[0]),
-                                   mxGetNumberOfElements(arguments[0]),
-                                   real(arguments[1]),
-                                   data<std::int8_t>(results[0]));
+    const auto* const ratios = data<const float>(arguments[0]);
+    const std::size_t count = mxGetNumberOfElements(arguments[0]);
+    const std::uint32_t width = whole(arguments[2]);
+    results[0] =
+        numericMatrix(mxGetM(arguments[0]), mxGetN(arguments[0]), width == coreWidth ? mxINT8_CLASS : mxINT16_CLASS);
+    return width == coreWidth
+               ? morvik_link_soft_values(ratios, count, real(arguments[1]), data<std::int8_t>(results[0]))
+               : morvik_link_soft_values_i16(ratios, count, real(arguments[1]), width, data<std::int16_t>(results[0]));
 }
 
 /// algorithm, bits per symbol, code rate -> scale
@@ -215,6 +254,22 @@ std::int32_t demap(Results results, Arguments arguments)
                              real(arguments[4]),
                              count * blocks,
                              data<float>(results[0]));
+}
+
+/// bits per symbol, fading, demapper, thousandths of a decibel, seed, bits -> ratios
+std::int32_t transmit(Results results, Arguments arguments)
+{
+    using namespace morvik::link;
+    const SymbolFormat format{modulations[whole(arguments[0]) / 2],
+                              fadings[whole(arguments[1])],
+                              demappers[whole(arguments[2])],
+                              static_cast<int>(*data<const double>(arguments[3]))};
+    const auto seed = static_cast<std::uint64_t>(*data<const double>(arguments[4]));
+    const std::size_t count = mxGetM(arguments[5]);
+    const std::size_t blocks = mxGetN(arguments[5]);
+    results[0] = numericMatrix(count, blocks, mxSINGLE_CLASS);
+    transmitRows(format, seed, bits(arguments[5]), blocks, count, data<float>(results[0]));
+    return MORVIK_LINK_OK;
 }
 
 // ---- Transport blocks: a format is five numbers, in the order of morvik_link_format
@@ -261,21 +316,27 @@ std::int32_t encode(Results results, Arguments arguments)
                      transport.get(), whole(arguments[1]), blocks, bits(arguments[2]), bits(results[0]));
 }
 
-/// format, version, ratios, soft buffers or nothing -> soft buffers
+/// format, version, ratios or steps, soft buffers or nothing, width of steps -> soft buffers
 std::int32_t recover(Results results, Arguments arguments)
 {
     Transport transport;
     const std::int32_t status = make(arguments[0], transport);
-    const std::size_t blocks = mxGetN(arguments[2]);
-    results[0] = mxIsEmpty(arguments[3])
-                     ? numericMatrix(morvik_link_transport_buffer_size(transport.get()), blocks, mxSINGLE_CLASS)
-                     : mxDuplicateArray(arguments[3]);
-    return status != MORVIK_LINK_OK ? status
-                                    : morvik_link_transport_recover(transport.get(),
-                                                                    whole(arguments[1]),
-                                                                    blocks,
-                                                                    data<const float>(arguments[2]),
-                                                                    data<float>(results[0]));
+    const std::uint32_t version = whole(arguments[1]);
+    const mxArray* const received = arguments[2];
+    const std::size_t blocks = mxGetN(received);
+    results[0] = buffersBefore(arguments[3], morvik_link_transport_buffer_size(transport.get()), received);
+    if (status != MORVIK_LINK_OK) {
+        return status;
+    }
+    return areSteps(received)
+               ? morvik_link_transport_recover_i16(transport.get(),
+                                                   version,
+                                                   blocks,
+                                                   data<const std::int16_t>(received),
+                                                   whole(arguments[4]),
+                                                   data<std::int16_t>(results[0]))
+               : morvik_link_transport_recover(
+                     transport.get(), version, blocks, data<const float>(received), data<float>(results[0]));
 }
 
 /// format -> values of a soft buffer
@@ -287,7 +348,32 @@ std::int32_t transportBuffer(Results results, Arguments arguments)
     return status;
 }
 
-/// format, number of a code block, soft buffers, scale -> sys, par1, par2
+/// format -> a column for each code block, with the members of morvik_link_places; places are counted from 1
+std::int32_t codeBlocks(Results results, Arguments arguments)
+{
+    Transport transport;
+    morvik_link_code_blocks blocks{};
+    const std::int32_t status = make(arguments[0], transport);
+    morvik_link_segment(formatOf(arguments[0]).transport_block_size, &blocks);
+    results[0] = numericMatrix(8, blocks.count, mxDOUBLE_CLASS);
+    double* to = data<double>(results[0]);
+    for (std::uint32_t r = 0; r < blocks.count && status == MORVIK_LINK_OK; ++r) {
+        const morvik_link_places places = placesOf(transport, r);
+        for (const std::uint32_t number : {places.size,
+                                           places.fillers,
+                                           places.payload,
+                                           places.payload_at + 1,
+                                           places.coded_bits,
+                                           places.coded_at + 1,
+                                           places.buffer_size,
+                                           places.buffer_at + 1}) {
+            *to++ = number;
+        }
+    }
+    return status;
+}
+
+/// format, number of a code block, soft buffers of ratios or of steps, scale of ratios -> sys, par1, par2
 std::int32_t blockValues(Results results, Arguments arguments)
 {
     Transport transport;
@@ -297,15 +383,17 @@ std::int32_t blockValues(Results results, Arguments arguments)
     for (std::size_t s = 0; s < 3; ++s) {
         results[s] = numericMatrix(placesOf(transport, r).size + tailPositions, blocks, mxINT8_CLASS);
     }
-    return status != MORVIK_LINK_OK ? status
-                                    : morvik_link_transport_soft_values(transport.get(),
-                                                                        r,
-                                                                        blocks,
-                                                                        data<const float>(arguments[2]),
-                                                                        real(arguments[3]),
-                                                                        data<std::int8_t>(results[0]),
-                                                                        data<std::int8_t>(results[1]),
-                                                                        data<std::int8_t>(results[2]));
+    if (status != MORVIK_LINK_OK) {
+        return status;
+    }
+    auto* const sys = data<std::int8_t>(results[0]);
+    auto* const par1 = data<std::int8_t>(results[1]);
+    auto* const par2 = data<std::int8_t>(results[2]);
+    return areSteps(arguments[2])
+               ? morvik_link_transport_soft_values_i16(
+                     transport.get(), r, blocks, data<const std::int16_t>(arguments[2]), sys, par1, par2)
+               : morvik_link_transport_soft_values(
+                     transport.get(), r, blocks, data<const float>(arguments[2]), real(arguments[3]), sys, par1, par2);
 }
 
 /// format, cell of the decisions on each code block -> bits, whether all CRCs fit, whether each code block's fits
@@ -349,7 +437,7 @@ struct Command {
     std::int32_t (*run)(Results results, Arguments arguments);
 };
 
-constexpr std::array<Command, 15> commands = {{{"crc", crc},
+constexpr std::array<Command, 17> commands = {{{"crc", crc},
                                                {"segment", segment},
                                                {"rate_match", rateMatch},
                                                {"rate_recover", rateRecover},
@@ -359,9 +447,11 @@ constexpr std::array<Command, 15> commands = {{{"crc", crc},
                                                {"ratio_scale", ratioScale},
                                                {"map", map},
                                                {"demap", demap},
+                                               {"transmit", transmit},
                                                {"encode", encode},
                                                {"recover", recover},
                                                {"transport_buffer", transportBuffer},
+                                               {"code_blocks", codeBlocks},
                                                {"block_values", blockValues},
                                                {"join", join}}};
 

@@ -26,6 +26,6 @@ function coded = morvik_lte_rate_match(sys, par1, par2, count, varargin)
         error('morvik:badSize', '%s: sys, par1 and par2 have to be matrices of one size', caller);
     end
     count = morvik_lte_number(caller, 'count', count, 0, 2 ^ 31 - 1);
-    matching = morvik_lte_matching(caller, size(sys, 1) - 4, varargin);
+    matching = morvik_lte_matching(caller, size(sys, 1) - 4, struct('version', 0), varargin);
     coded = morvik_lte_call(caller, 'rate_match', matching, sys, par1, par2, count);
 end

@@ -2,12 +2,14 @@
 %
 %   buffers = morvik_lte_rate_recover(ratios, K, option, value, ...)
 %
-% ratios     log-likelihood ratios ln(P(1) / P(0)), a block in each column
+% ratios     log-likelihood ratios ln(P(1) / P(0)), a block in each column; with the option width, whole steps of class
+%            int8 or int16, as morvik_lte_soft_values gives them
 % K          block size
-% buffers    soft buffers, single: the circular buffer without its dummy and filler bits
+% buffers    soft buffers: the circular buffer without its dummy and filler bits, single, or int16 with a width
 %
 % Options:
 %   'buffers'    what earlier transmissions left; [] before the first one (default)
+%   'width'      bits of a soft buffer's values, 2 to 16: each sum is clipped to them; [] adds in floating point (default)
 %   'version', 'fillers', 'buffer_size'    as for morvik_lte_rate_match
 %
 % Errors:   morvik:badCall, morvik:badClass, morvik:badSize, morvik:badValue, morvik:badOption
@@ -18,9 +20,10 @@ function buffers = morvik_lte_rate_recover(ratios, K, varargin)
     if nargin < 2
         error('morvik:badCall', '%s: needs ratios and the block size', caller);
     end
-    ratios = morvik_lte_ratios(caller, 'ratios', ratios);
-    [matching, before] = morvik_lte_matching(caller, K, varargin);
+    defaults = struct('version', 0, 'buffers', [], 'width', []);
+    [matching, options] = morvik_lte_matching(caller, K, defaults, varargin);
+    [ratios, width] = morvik_lte_received(caller, ratios, options.width);
     rows = morvik_lte_call(caller, 'buffer_size', matching);
-    before = morvik_lte_buffers(caller, before, rows, size(ratios, 2));
-    buffers = morvik_lte_call(caller, 'rate_recover', matching, ratios, before);
+    before = morvik_lte_buffers(caller, options.buffers, class(ratios), rows, size(ratios, 2));
+    buffers = morvik_lte_call(caller, 'rate_recover', matching, ratios, before, width);
 end

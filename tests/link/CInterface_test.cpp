@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <limits>
 #include <set>
@@ -237,6 +238,51 @@ TEST(LinkInterfaceTest, SoftBuffersOfWholeStepsGiveTheirValues)
     EXPECT_EQ(bySteps.sys, fromRatios.sys);
     EXPECT_EQ(bySteps.par1, fromRatios.par1);
     EXPECT_EQ(bySteps.par2, fromRatios.par2);
+}
+
+/// The sum of values, each times its place from 1 on.
+template <class Value>
+std::int64_t weighted(const std::vector<Value>& values)
+{
+    std::int64_t sum = 0;
+    for (std::size_t i = 0; i < values.size(); ++i) {
+        sum += static_cast<std::int64_t>(i + 1) * values[i];
+    }
+    return sum;
+}
+
+// The tests of the Python package and of the Octave functions expect the same numbers.
+TEST(LinkInterfaceTest, SoftBuffersOfSixBitsHoldTheSameNumbersInEachLanguage)
+{
+    const Transport transport({7000, 9000, 4, 1, 16000});
+    std::vector<std::int16_t> buffers(morvik_link_transport_buffer_size(transport.get()));
+    std::vector<std::int16_t> steps(9000);
+    Floats ratios(9000);
+    for (const std::uint32_t t : {0U, 1U, 2U}) {
+        for (std::uint32_t i = 0; i < 9000; ++i) {
+            ratios[i] = (static_cast<float>((7919 * i + 31 * t) % 1021) - 510) / 16;
+        }
+        ASSERT_EQ(morvik_link_soft_values_i16(ratios.data(), 9000, 1, 6, steps.data()), MORVIK_LINK_OK);
+        ASSERT_EQ(
+            morvik_link_transport_recover_i16(transport.get(), t == 1 ? 2 : 0, 1, steps.data(), 6, buffers.data()),
+            MORVIK_LINK_OK);
+    }
+    EXPECT_EQ(buffers.size(), 15817U);
+    EXPECT_EQ(*std::min_element(buffers.begin(), buffers.end()), -32);
+    EXPECT_EQ(*std::max_element(buffers.begin(), buffers.end()), 31);
+    EXPECT_EQ(weighted(buffers), -14906593);
+    const std::array<std::array<std::int64_t, 3>, 2> expected = {
+        {{-1142900, -603343, -15771}, {-3348177, 776852, -132104}}};
+    for (std::uint32_t r = 0; r < expected.size(); ++r) {
+        Streams streams(transport.places(r).size + 4);
+        ASSERT_EQ(
+            morvik_link_transport_soft_values_i16(
+                transport.get(), r, 1, buffers.data(), streams.sys.data(), streams.par1.data(), streams.par2.data()),
+            MORVIK_LINK_OK);
+        EXPECT_EQ(weighted(streams.sys), expected[r][0]);
+        EXPECT_EQ(weighted(streams.par1), expected[r][1]);
+        EXPECT_EQ(weighted(streams.par2), expected[r][2]);
+    }
 }
 
 TEST(LinkInterfaceTest, RecoversInFloatsAndInSteps)

@@ -1,11 +1,12 @@
 % The format of transport blocks that a call describes, as the library takes it, and its options, those of the format and
 % of `more`.
 function [format, options] = morvik_lte_format(caller, transport_block_size, coded_bits, modulation, more, given)
-    more.version = 0;
     more.layers = 1;
     more.soft_buffer_size = 0;
     options = morvik_lte_options(caller, more, given);
-    options.version = morvik_lte_number(caller, 'version', options.version, 0, 3);
+    if isfield(options, 'version')
+        options.version = morvik_lte_number(caller, 'version', options.version, 0, 3);
+    end
     layers = morvik_lte_number(caller, 'layers', options.layers, 1, 4);
     symbol = morvik_lte_modulation(caller, modulation) * layers;
     coded_bits = morvik_lte_number(caller, 'coded_bits', coded_bits, 1, 2 ^ 31 - 1);

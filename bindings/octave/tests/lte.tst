@@ -55,6 +55,7 @@
 %! assert(decided, bits);
 
 %!test  % the scale suits modulation, code rate and algorithm
+%! assert(morvik_lte_scale('64qam', 2 / 3), 2.3, 0.01);
 %! bits = rand(2000, 100) < 0.5;
 %! ratios = 3 * (2 * morvik_lte_encode(bits, 3000, '64qam') - 1) + 4.5 * randn(3000, 100);
 %! buffers = morvik_lte_recover(ratios, 2000, '64qam');
@@ -71,8 +72,86 @@
 %! coded = morvik_lte_rate_match(sys, par1, par2, 4000, 'fillers', 17, 'version', 1);
 %! buffers = morvik_lte_rate_recover(2 * coded - 1, 1024, 'fillers', 17, 'version', 1);
 %! [sys, par1, par2] = morvik_lte_deinterleave(morvik_lte_soft_values(buffers, 20), 1024, 'fillers', 17);
-%! assert(sys(1:17, :), single(-128 * ones(17, 4)));
+%! assert(sys(1:17, :), int8(-128 * ones(17, 4)));
 %! assert(morvik_decode(sys, par1, par2), bits);
+
+%!test  % soft buffers of six bits, the same numbers as in C and Python (CInterface_test, test_lte)
+%! buffers = [];
+%! versions = [0, 2, 0];
+%! narrow = {'width', 6, 'soft_buffer_size', 16000};
+%! weighted = @(values) (1:numel(values)) * double(values(:));
+%! for t = 1:3
+%!     ratios = (mod(7919 * (0:8999).' + 31 * (t - 1), 1021) - 510) / 16;
+%!     buffers = morvik_lte_recover(morvik_lte_soft_values(ratios, 1, 6), 7000, '16qam', 'version', versions(t), ...
+%!         'buffers', buffers, narrow{:});
+%! end
+%! assert(class(buffers), 'int16');
+%! assert([numel(buffers), double(min(buffers)), double(max(buffers)), weighted(buffers)], [15817, -32, 31, -14906593]);
+%! streams = morvik_lte_streams(buffers, 7000, 9000, '16qam', 'soft_buffer_size', 16000);
+%! assert(cellfun(weighted, streams), [-1142900, -603343, -15771; -3348177, 776852, -132104]);
+%! blocks = morvik_lte_code_blocks(7000, 9000, '16qam', 'soft_buffer_size', 16000);
+%! assert([blocks.buffer_at], [1, 7882]);
+%! assert(cell2mat(struct2cell(blocks(2))).', [3584, 0, 3560, 3465, 4500, 4501, 7936, 7882]);
+
+%!test  % narrow soft buffers of code blocks saturate, and lose what wide ones keep
+%! rand('seed', 3);
+%! bits = rand(40, 2) < 0.5;
+%! [sys, par1, par2] = morvik_encode(bits);
+%! coded = morvik_lte_rate_match(sys, par1, par2, 264);
+%! steps = int8(30 * (2 * coded - 1));
+%! buffers = morvik_lte_rate_recover(steps, 40, 'width', 6);
+%! assert(unique(buffers), int16([-32; 31]));
+%! again = morvik_lte_rate_recover(steps, 40, 'width', 8, 'buffers', buffers);
+%! assert(unique(again), int16([-92; 91]));
+%! assert(morvik_lte_rate_recover(int16(steps), 40, 'width', 7), int16(60 * (buffers > 0) - 60 * (buffers < 0)));
+
+%!test  % retransmissions in six bits decode as well as wide ones
+%! rand('seed', 1);
+%! bits = rand(6000, 20) < 0.5;
+%! for width = {[], 6}
+%!     buffers = [];
+%!     for version = [0, 2]
+%!         values = morvik_lte_transmit(morvik_lte_encode(bits, 7200, '64qam', 'version', version), '64qam', 11, ...
+%!             'seed', version);
+%!         if ~isempty(width{1})
+%!             values = morvik_lte_soft_values(values, 3, width{1});
+%!         end
+%!         buffers = morvik_lte_recover(values, 6000, '64qam', 'version', version, 'buffers', buffers, 'width', width{1});
+%!     end
+%!     [decided, fits] = morvik_lte_decode(buffers, 6000, 7200, '64qam');
+%!     assert(fits, true(1, 20));
+%!     assert(decided, bits);
+%! end
+
+%!test  % a loop of one's own decides as morvik_lte_decode does, in code blocks of two sizes
+%! rand('seed', 4);
+%! bits = rand(19000, 3) < 0.5;
+%! ratios = morvik_lte_transmit(morvik_lte_encode(bits, 24000, 'qpsk'), 'qpsk', 5.6, 'seed', 1);
+%! buffers = morvik_lte_recover(ratios, 19000, 'qpsk');
+%! streams = morvik_lte_streams(buffers, 19000, 24000, 'qpsk', 'algorithm', 'table');
+%! decisions = cell(4, 1);
+%! for r = 1:4
+%!     decisions{r} = morvik_decode(streams{r, :}, 'algorithm', 'table', 'iterations', 3);
+%! end
+%! [joined, fits, each] = morvik_lte_join(decisions, 19000, 24000, 'qpsk');
+%! [decided, all_fit, each_fits] = morvik_lte_decode(buffers, 19000, 24000, 'qpsk', 'algorithm', 'table', 'iterations', 3);
+%! assert(joined, decided);
+%! assert({fits, each}, {all_fit, each_fits});
+%! assert(any(each(:)) && any(~each(:)));
+
+%!test  % noise is that of Python for a seed (test_lte), and that of the channel
+%! bits = reshape(mod(0:4799, 3) == 0, 2400, 2);
+%! ratios = morvik_lte_transmit(bits, '16qam', 8, 'channel', 'rayleigh', 'seed', 36212);
+%! values = double(morvik_lte_soft_values(ratios, 4));
+%! assert((1:4800) * values(:), -87950402);
+%! rand('seed', 5);
+%! randn('seed', 5);
+%! bits = rand(60000, 4) < 0.5;
+%! noise = sqrt(10 ^ -0.3 / 2) * complex(randn(30000, 4), randn(30000, 4));
+%! plain = morvik_lte_demap(morvik_lte_map(bits, 'qpsk') + noise, 'qpsk', 10 ^ -0.3);
+%! ratios = morvik_lte_transmit(bits, 'qpsk', 3);
+%! assert(mean(ratios(:) .* (2 * bits(:) - 1)), mean(plain(:) .* (2 * bits(:) - 1)), -0.02);
+%! assert(any(ratios(:) ~= morvik_lte_transmit(bits, 'qpsk', 3)(:)));
 
 %!test  % CRCs: over a one alone, they are the generators
 %! assert(morvik_lte_crc(true).', dec2bin(hex2dec('864CFB'), 24) == '1');
@@ -82,6 +161,7 @@
 
 %!test  % how ratios are rounded
 %! assert(morvik_lte_soft_values([0.5 -0.5 0.49; 127 -9 999], 1), int8([1 -1 0; 127 -9 127]));
+%! assert(morvik_lte_soft_values([15.9 16 -16 0.06], 2, 6), int16([31 31 -32 0]));
 
 %!test  % no block at all
 %! assert(size(morvik_lte_encode(zeros(8, 0), 80, 'qpsk')), [80, 0]);
@@ -106,3 +186,23 @@
 %!error id=morvik:badSize morvik_lte_rate_match(ones(44, 1), ones(43, 1), ones(44, 1), 80);
 %!error id=morvik:badValue morvik_lte_segment(0);
 %!error id=morvik:badOption morvik_lte_crc(1, '16');
+%!error <there is no option version; there are filler, fillers> morvik_lte_deinterleave(ones(132, 1), 40, 'version', 1);
+%!error <filler has to be a whole number from -128 to 127> morvik_lte_deinterleave(ones(132, 1, 'int8'), 40, 'filler', 128);
+%!error <filler has to be one number> morvik_lte_deinterleave(ones(132, 1), 40, 'filler', [1 2]);
+%!error <buffers have to be of 132 rows, not 131> morvik_lte_deinterleave(ones(131, 1), 40);
+%!error <whole steps, a matrix of class int8 or int16, not double> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'width', 6);
+%!error <width has to be a whole number from 2 to 16> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'width', 17);
+%!error <width has to be a whole number from 2 to 16> morvik_lte_soft_values(1, 4, 1);
+%!error <of class single here, not int16> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'buffers', zeros(132, 1, 'int16'));
+%!error <of class int16 here, not double> morvik_lte_rate_recover(int8(1), 40, 'width', 6, 'buffers', zeros(132, 1));
+%!error <scale has to be \[\] for buffers of whole steps> morvik_lte_decode(zeros(132, 1, 'int16'), 16, 80, 'qpsk', 'scale', 1);
+%!error <decisions have to be a cell of 1 code blocks> morvik_lte_join({}, 16, 80, 'qpsk');
+%!error <decisions on code block 1 have to be 40x1, not 39x1> morvik_lte_join({ones(39, 1)}, 16, 80, 'qpsk');
+%!error id=morvik:badCall morvik_lte_streams();
+%!error id=morvik:badCall morvik_lte_code_blocks(1);
+%!error id=morvik:badValue morvik_lte_scale('qpsk', 0);
+%!error id=morvik:badOption morvik_lte_scale('qpsk', 0.5, 'fast');
+%!error <3 rows of bits are no multiple of the 2 of a symbol> morvik_lte_transmit([0; 1; 1], 'qpsk', 3);
+%!error <esn0_db has to be a number from -50 to 50> morvik_lte_transmit([0; 1], 'qpsk', 50.001);
+%!error <in steps of 0.001> morvik_lte_transmit([0; 1], 'qpsk', 1.00001);
+%!error <channel has to be one of awgn, rayleigh> morvik_lte_transmit([0; 1], 'qpsk', 3, 'channel', 'fog');

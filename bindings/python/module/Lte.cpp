@@ -15,9 +15,6 @@
 #include "Decoder.h"
 #include "link/RatioScale.h"
 #include "link/SymbolLink.h"
-#include "link/coding/PackedBits.h"
-#include "link/random/Random.h"
-#include "link/random/SamplerForm.h"
 #include "morvik_link.h"
 #include "rules/Tail.h"
 
@@ -246,12 +243,7 @@ Array<float> transmit(const Array<std::uint8_t>& bits,
                                     milliDecibels};
     Array<float> ratios = matrix<float>(rows(bits), columns(bits));
     run([&, from = bits.data(), to = ratios.mutable_data(), count = columns(bits), blocks = rows(bits)] {
-        link::SymbolLink symbols(format, link::randomKey(seed), link::samplerForms().front());
-        std::vector<std::uint64_t> packed(link::wordsOf(count));
-        for (std::size_t b = 0; b < blocks; ++b) {
-            link::packBits(from + b * count, count, packed.data());
-            symbols.receive(b, 0, packed.data(), count, to + b * count);
-        }
+        link::transmitRows(format, seed, from, blocks, count, to);
         return MORVIK_LINK_OK;
     });
     return ratios;

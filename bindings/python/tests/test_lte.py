@@ -5,7 +5,7 @@ import csv
 import morvik
 import numpy as np
 import pytest
-from morvik import lte
+from morvik import _core, lte
 
 MODULATIONS = {1: "bpsk", 2: "qpsk", 4: "16qam", 6: "64qam", 8: "256qam"}
 
@@ -81,6 +81,28 @@ def test_a_retransmission_helps():
     narrow = chain.recover(lte.soft_values(second, 4, width=6), 2, narrow, width=6)
     assert narrow.dtype == np.int16 and narrow.min() >= -32 and narrow.max() <= 31
     assert chain.decode(decoder, narrow).fits.all()
+
+
+def weighted(values):
+    return int(values.reshape(-1).astype(int) @ np.arange(1, values.size + 1))
+
+
+def test_soft_buffers_of_six_bits_hold_the_same_numbers_as_in_c_and_octave():
+    chain = lte.Transport(7000, 9000, "16qam", soft_buffer_size=16000)
+    buffers = None
+    for t, version in enumerate((0, 2, 0)):
+        llrs = ((7919 * np.arange(9000) + 31 * t) % 1021 - 510) / 16
+        buffers = chain.recover(lte.soft_values(llrs, 1, width=6), version, buffers, width=6)
+    assert (buffers.size, buffers.min(), buffers.max(), weighted(buffers)) == (15817, -32, 31, -14906593)
+    streams = [[weighted(stream) for stream in block] for block in chain.soft_values(buffers)]
+    assert streams == [[-1142900, -603343, -15771], [-3348177, 776852, -132104]]
+    assert chain.code_block(1) == (3584, 0, 3560, 3464, 4500, 4500, 7936, 7881)
+
+
+def test_noise_of_a_seed_is_that_of_octave():
+    bits = (np.arange(4800) % 3 == 0).astype(np.uint8).reshape(2, 2400)
+    llrs = _core.transmit_symbols(bits, 4, "rayleigh", "max-log", 8000, 36212)
+    assert weighted(lte.soft_values(llrs, 4)) == -87950402
 
 
 @pytest.mark.parametrize(("block_size", "fillers", "buffer_size"), [(40, 0, None), (1024, 17, 2000), (6144, 0, None)])
