@@ -22,7 +22,7 @@ case $(file -L "$build/bin/morvik") in
         expected=("$library" "$link" "$development" morvik morvik-simulators) ;;
     *)
         architecture=amd64
-        expected=("$library" "$link" "$development" morvik morvik-mpi morvik-simulators python3-morvik octave-morvik morvik-doc) ;;
+        expected=("$library" "$link" "$development" morvik morvik-mpi morvik-simulators python3-morvik gr-morvik octave-morvik morvik-doc) ;;
 esac
 names=()
 for package in *.deb; do
@@ -35,7 +35,7 @@ echo "lintian"
 lintian --fail-on error,warning ./*.deb 2>&1 || fail "lintian finds faults"
 
 field() {
-    dpkg-deb --field "$1_${version}_$architecture.deb" "$2"
+    dpkg-deb --field "$1_${version}_"*.deb "$2"
 }
 depends() {
     [[ ", $(field "$1" Depends)," == *", $2"[\ ,]* ]] || fail "$1 does not depend on $2: $(field "$1" Depends)"
@@ -81,6 +81,8 @@ PKG_CONFIG_LIBDIR=$LD_LIBRARY_PATH/pkgconfig OUT=$folder/programs make -s -C "$s
 if [ "$architecture" = amd64 ]; then
     depends morvik-mpi libopenmpi3
     depends python3-morvik python3-numpy
+    depends gr-morvik gnuradio
+    depends gr-morvik python3-morvik
     depends octave-morvik octave-abi-57
     echo "Python"
     PYTHONPATH=$folder/root/usr/lib/python3/dist-packages /usr/bin/python3 -c "
@@ -89,11 +91,19 @@ streams = morvik.encode(numpy.ones((1, 40), dtype=numpy.uint8))
 print(morvik.__file__)
 assert morvik.__version__ == '${version%-1}'
 " | grep -F "$folder/root"
+    echo "GNU Radio"
+    # The editor's compiler finds the descriptions, and the flowgraph the blocks.
+    flowgraph=$share/doc/gr-morvik/examples/gnuradio_chain.grc
+    HOME=$folder GRC_BLOCKS_PATH=$share/gnuradio/grc/blocks grcc --output "$folder" "$flowgraph" >grcc.log 2>&1 ||
+        { cat grcc.log; fail "The flowgraph is refused"; }
+    HOME=$folder PYTHONPATH=$folder/root/usr/lib/python3/dist-packages /usr/bin/python3 gnuradio_chain.py |
+        grep ' of 200 transport blocks fit'
     echo "Octave"
     functions=$(dirname "$(find root/usr/lib -name morvik_decode.m)")
     octave-cli --no-history --norc --path "$functions" --eval "
         bits = rand(40, 3) < 0.5;
         [a, b, c] = morvik_encode(bits);
         assert(isequal(morvik_decode(16 * (2 * a - 1), 16 * (2 * b - 1), 16 * (2 * c - 1)), bits));
+        assert(~any(morvik_lte_crc([bits; morvik_lte_crc(bits)])(:)));
         printf('%s\n', which('morvik_decode'))" | grep -F "$functions"
 fi

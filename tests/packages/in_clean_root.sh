@@ -54,6 +54,10 @@ assert (decided.bits == sent).all()
 print(morvik.__version__)
 "
 
+echo "== GNU Radio"
+as_nobody grcc --output scratch /usr/share/doc/gr-morvik/examples/gnuradio_chain.grc >/dev/null
+as_nobody python3 scratch/gnuradio_chain.py
+
 echo "== Octave"
 as_nobody octave-cli --no-history --norc --eval "
 bits = rand(512, 3) < 0.5;
