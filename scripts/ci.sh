@@ -59,42 +59,50 @@ stage_compilers() {
     done
 }
 
-# Compares the binary interface with the committed one, which is stored compressed.
+# The libraries, and the files of tests/data/ with their binary interfaces.
+declare -A interfaces=([morvik_v1_0_bitacc_cmodel]=abi [morvik_link]=abi.link)
+
+# Compares the binary interfaces with the committed ones, which are stored compressed.
 stage_abi() {
-    local bits
+    local bits library
     for bits in 64 32; do
-        scripts/build abi-$bits morvik_v1_0_bitacc_cmodel
-        compare_abi "$bits" "tests/data/abi.$bits.xml.xz"
+        build_abi $bits
+        for library in "${!interfaces[@]}"; do
+            compare_abi $bits "$library" "tests/data/${interfaces[$library]}.$bits.xml.xz"
+        done
     done
 }
 
-compare_abi() {
-    xz --decompress --stdout "$2" >"build/abi-$1.xml"
-    abidiff "build/abi-$1.xml" "$(library_of "$1")"
-}
-
-# Makes the current interface the committed one, after an intended change.
+# Makes the current interfaces the committed ones, after an intended change.
 stage_abi-renew() {
-    local bits
+    local bits library
     for bits in 64 32; do
-        write_abi "$bits" "tests/data/abi.$bits.xml.xz"
+        build_abi $bits
+        for library in "${!interfaces[@]}"; do
+            write_abi $bits "$library" "tests/data/${interfaces[$library]}.$bits.xml.xz"
+        done
     done
 }
 
-# What users' headers do not declare may change.
+build_abi() {
+    scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel morvik_link_c
+}
+
+# compare_abi BITS LIBRARY FILE
+compare_abi() {
+    xz --decompress --stdout "$3" >"build/abi-$1.xml"
+    abidiff "build/abi-$1.xml" "build/abi-$1/lib/lib$2.so"
+}
+
+# write_abi BITS LIBRARY FILE. What users' headers do not declare may change.
 write_abi() {
-    scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel
     local headers=build/abi-headers
     rm -rf "$headers"
     mkdir "$headers"
     cp include/*.h rules/*.h src/DecoderState.h "$headers"
     sed -n '/^set(MORVIK_CLASS_HEADERS/,/)/s/^ *\([A-Za-z0-9]*\.h\).*/src\/\1/p' cmake/Install.cmake | xargs cp -t "$headers"
-    abidw --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
-        --headers-dir "$headers" "$(library_of "$1")" | xz -9 >"$2"
-}
-
-library_of() {
-    echo "build/abi-$1/lib/libmorvik_v1_0_bitacc_cmodel.so"
+    abidw --exported-interfaces-only --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
+        --headers-dir "$headers" "build/abi-$1/lib/lib$2.so" | xz -9 >"$3"
 }
 
 # Address and undefined behaviour sanitizers on all tests, then valgrind, which detects reads of uninitialised memory,
@@ -185,12 +193,15 @@ stage_packages() {
 # Runs everything that is rarely run in its shortest form, so that it keeps working.
 stage_starts() {
     tidy tests/builds/digest.cpp bench/Limits.cpp
-    local preset
+    local preset library
     for preset in clang clang-32; do
         scripts/build "$preset" lanes_objects header_test
     done
-    write_abi 64 build/abi-64.renewed.xml.xz
-    compare_abi 64 build/abi-64.renewed.xml.xz
+    build_abi 64
+    for library in "${!interfaces[@]}"; do
+        write_abi 64 "$library" build/abi-64.renewed.xml.xz
+        compare_abi 64 "$library" build/abi-64.renewed.xml.xz
+    done
     scripts/build coverage TNumberFormat_test
     build/coverage/tests/TNumberFormat_test --gtest_brief=1
     count_lines src/TNumberFormat.cpp
