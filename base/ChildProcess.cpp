@@ -1,6 +1,7 @@
-// ChildProcess: runs another program to completion, without a shell.
+// ChildProcess: runs other programs, without a shell.
 #include "ChildProcess.h"
 
+#include <fcntl.h>
 #include <spawn.h>
 #include <sys/mman.h>
 #include <sys/wait.h>
@@ -8,7 +9,12 @@
 
 #include <array>
 #include <cerrno>
+#include <csignal>
+#include <streambuf>
 #include <system_error>
+#include <utility>
+
+#include "Descriptor.h"
 
 namespace morvik::base {
 
@@ -97,9 +103,8 @@ int waitFor(pid_t process)
     return status;
 }
 
-}  // namespace
-
-Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input)
+/// Starts a program with these standard streams.
+pid_t start(const std::vector<std::string>& commandLine, const std::array<int, 3>& descriptors)
 {
     std::vector<std::string> words = commandLine;
     std::vector<char*> argv;
@@ -109,17 +114,133 @@ Outcome runProgram(const std::vector<std::string>& commandLine, const std::strin
     }
     argv.push_back(nullptr);
 
-    const MemoryFile in(input);
-    const MemoryFile out;
-    const MemoryFile err;
-    const Streams streams({in.descriptor(), out.descriptor(), err.descriptor()});
+    const Streams streams(descriptors);
     pid_t process = 0;
     const int error = posix_spawnp(&process, argv[0], streams.actions(), nullptr, argv.data(), environ);
     if (error != 0) {
         fail(error);
     }
-    const int status = waitFor(process);
-    return {WIFEXITED(status) && WEXITSTATUS(status) == 0, out.content(), err.content()};
+    return process;
+}
+
+bool isSuccess(int status)
+{
+    return WIFEXITED(status) && WEXITSTATUS(status) == 0;
+}
+
+/// Reads what comes out of a pipe.
+class PipeBuffer : public std::streambuf {
+public:
+    explicit PipeBuffer(Descriptor pipe) : itsPipe(std::move(pipe)) {}
+
+    bool isAtEnd() const
+    {
+        return itsIsAtEnd;
+    }
+
+protected:
+    int_type underflow() override
+    {
+        ssize_t count = -1;
+        do {
+            count = read(itsPipe.number(), itsContent.data(), itsContent.size());
+        } while (count < 0 && errno == EINTR);
+        if (count <= 0) {
+            itsIsAtEnd = count == 0;
+            return traits_type::eof();
+        }
+        setg(itsContent.data(), itsContent.data(), itsContent.data() + count);
+        return traits_type::to_int_type(itsContent.front());
+    }
+
+private:
+    Descriptor itsPipe;
+    std::array<char, 65536> itsContent{};
+    bool itsIsAtEnd = false;
+};
+
+/// The ends of a pipe, which other programs do not inherit.
+struct Pipe {
+    Pipe()
+    {
+        std::array<int, 2> ends{};
+        if (pipe2(ends.data(), O_CLOEXEC) != 0) {
+            fail(errno);
+        }
+        out = Descriptor(ends[0]);
+        in = Descriptor(ends[1]);
+    }
+
+    Descriptor out{-1};
+    Descriptor in{-1};
+};
+
+}  // namespace
+
+Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input)
+{
+    const MemoryFile in(input);
+    const MemoryFile out;
+    const MemoryFile err;
+    const int status = waitFor(start(commandLine, {in.descriptor(), out.descriptor(), err.descriptor()}));
+    return {isSuccess(status), out.content(), err.content()};
+}
+
+class RunningProgram::Process {
+public:
+    explicit Process(const std::vector<std::string>& commandLine) : Process(commandLine, Pipe()) {}
+    Process(const Process&) = delete;
+    Process& operator=(const Process&) = delete;
+
+    ~Process()
+    {
+        if (itsNumber > 0) {
+            kill(itsNumber, SIGTERM);
+            waitpid(itsNumber, nullptr, 0);
+        }
+    }
+
+    Outcome wait()
+    {
+        const int status = waitFor(std::exchange(itsNumber, 0));
+        return {isSuccess(status), "", itsMessages.content()};
+    }
+
+    PipeBuffer buffer;
+    std::istream output{&buffer};
+
+private:
+    Process(const std::vector<std::string>& commandLine, Pipe pipe)
+        : buffer(std::move(pipe.out)),
+          itsNumber(start(commandLine, {itsInput.descriptor(), pipe.in.number(), itsMessages.descriptor()}))
+    {
+    }
+
+    MemoryFile itsInput;
+    MemoryFile itsMessages;
+    pid_t itsNumber;
+};
+
+RunningProgram::RunningProgram(const std::vector<std::string>& commandLine)
+    : itsProcess(std::make_unique<Process>(commandLine))
+{
+}
+
+RunningProgram::~RunningProgram() = default;
+
+std::istream& RunningProgram::output()
+{
+    return itsProcess->output;
+}
+
+bool RunningProgram::isAtEnd() const
+{
+    return itsProcess->buffer.isAtEnd();
+}
+
+Outcome RunningProgram::wait()
+{
+    return itsProcess->wait();
 }
 
 }  // namespace morvik::base

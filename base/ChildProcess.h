@@ -1,7 +1,9 @@
-// ChildProcess: runs another program to completion, without a shell.
+// ChildProcess: runs other programs, without a shell.
 #ifndef MORVIK_BASE_CHILDPROCESS_H
 #define MORVIK_BASE_CHILDPROCESS_H
 
+#include <istream>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -17,6 +19,31 @@ struct Outcome {
 /// Runs a program found through PATH, with `input` on its standard input, and waits for it to end. Throws
 /// std::system_error if it cannot be started.
 Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input);
+
+/// A program whose standard output is read while it runs. It gets no standard input.
+class RunningProgram {
+public:
+    /// Starts a program found through PATH. Throws std::system_error if it cannot be started.
+    explicit RunningProgram(const std::vector<std::string>& commandLine);
+    RunningProgram(const RunningProgram&) = delete;
+    RunningProgram& operator=(const RunningProgram&) = delete;
+
+    /// Ends the program if it still runs.
+    ~RunningProgram();
+
+    /// What the program writes.
+    std::istream& output();
+
+    /// Whether all of the output has been read.
+    bool isAtEnd() const;
+
+    /// Waits for the end of the program, all of whose output has been read. The outcome holds no output.
+    Outcome wait();
+
+private:
+    class Process;
+    std::unique_ptr<Process> itsProcess;
+};
 
 }  // namespace morvik::base
 

@@ -11,6 +11,12 @@ namespace morvik::base {
 /// without its end, is enough.
 const char* whyNoText(std::string_view beginning);
 
+/// What other programs turn into text.
+enum class Packing { none, gzip, fst };
+
+/// The packing of a file with such a beginning.
+Packing packingOf(std::string_view beginning);
+
 }  // namespace morvik::base
 
 #endif

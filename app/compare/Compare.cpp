@@ -13,6 +13,7 @@
 #include "SoftValueReader.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
+#include "base/UnpackedFile.h"
 #include "hardware/comparison/Comparison.h"
 #include "hardware/comparison/Coverage.h"
 #include "hardware/comparison/Dump.h"
@@ -44,14 +45,34 @@ comparison::NameMap readMap(const std::string& file)
     return comparison::readNameMap(input.stream(), input.name());
 }
 
-/// Whether the dump is a VCD, by the option or the file name extension.
-bool isVcd(const Options& options)
+bool endsIn(const std::string& name, const std::string& ending)
 {
-    const std::string ending = ".vcd";
-    const std::string& name = options.dump;
-    return options.form.empty()
-               ? name.size() > ending.size() && name.compare(name.size() - ending.size(), ending.size(), ending) == 0
-               : options.form == "vcd";
+    return name.size() > ending.size() && name.compare(name.size() - ending.size(), ending.size(), ending) == 0;
+}
+
+/// Whether the dump is a VCD, by the option, the content or the file name extension.
+bool isVcd(const Options& options, const base::UnpackedFile& input)
+{
+    if (options.form.empty()) {
+        return input.isFst() || endsIn(options.dump, ".vcd") || endsIn(options.dump, ".vcd.gz");
+    }
+    return options.form == "vcd";
+}
+
+void readDump(const Options& options, const comparison::NameMap& map, comparison::Dump& dump)
+{
+    base::UnpackedFile input(options.dump);
+    try {
+        if (isVcd(options, input)) {
+            comparison::readVcd(input.stream(), input.name(), map, dump);
+        } else {
+            comparison::readCsv(input.stream(), input.name(), map, dump);
+        }
+    } catch (const base::Error&) {
+        input.expectWhole();
+        throw;
+    }
+    input.expectWhole();
 }
 
 int compare(const Options& options)
@@ -63,13 +84,13 @@ int compare(const Options& options)
     const comparison::Model model =
         comparison::computeModel(run.block, run.generics, options.decoder.iterations, std::cerr);
     comparison::Dump dump(model.values.passes(), model.values.steps());
-    base::InputFile input(options.dump);
-    (isVcd(options) ? comparison::readVcd : comparison::readCsv)(input.stream(), input.name(), map, dump);
+    readDump(options, map, dump);
+    const std::string dumpName = options.dump == base::standardStream ? "<stdin>" : options.dump;
     using comparison::Unknown;
     const comparison::Comparison found =
         comparison::compare(model, dump.values, options.ignoreUnknown ? Unknown::isIgnored : Unknown::differs);
     if (found.compared() == 0) {
-        throw base::Error(input.name() +
+        throw base::Error(dumpName +
                           (found.unknown() > 0 ? ": has no known value" : ": has no value that the core computes"));
     }
     const comparison::Coverage coverage = comparison::coverageOf(model, dump);
@@ -79,7 +100,7 @@ int compare(const Options& options)
                                ? findOtherRuns(run, dump.values)
                                : std::vector<std::string>();
     print(coreLine(run.generics, options.decoder.iterations) +
-          comparison::textOf({found, coverage, model, dump, input.name(), options.partial, otherRuns}));
+          comparison::textOf({found, coverage, model, dump, dumpName, options.partial, otherRuns}));
     return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
 }
 

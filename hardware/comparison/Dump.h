@@ -54,11 +54,22 @@ struct Dump {
 /// unknown, an empty one absent. Throws base::Error, prefixed with the location.
 void readCsv(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
+/// What a dump may have without an end in sight.
+struct DumpLimits {
+    /// Times in a row of a value change dump at which no further place gets a value: a simulation runs on before and
+    /// after the block, but not for ever.
+    std::uint64_t idleTimes = 100000000;
+};
+
 /// Reads a value change dump. In each scope with signals, half_iteration and step (in the scope or an enclosing one)
 /// give the place of the signals' values, sampled at the end of each time at which the scope has changed. A value is
 /// unknown if it is so at all times at which half_iteration and step name it; x at other times means nothing. Throws
 /// base::Error, prefixed with the location.
 void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
+
+/// The same with other limits.
+void readVcdWithin(
+    const DumpLimits& limits, std::istream& input, const std::string& name, const NameMap& map, Dump& dump);
 
 /// Copies a branch metric of the dump to its twin if the dump lacks that. Throws base::Error if the map does so and the
 /// dump has both.

@@ -46,8 +46,8 @@ struct Timescale {
 
 class VcdReader {
 public:
-    VcdReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
-        : itsFile(input, name), itsMap(map), itsDump(dump), itsScopes(map)
+    VcdReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump, const DumpLimits& limits)
+        : itsFile(input, name), itsMap(map), itsDump(dump), itsLimits(limits), itsScopes(map)
     {
         dump.waveform.emplace(dump.lines.size());
         itsReals.numbers = NumberForm::real;
@@ -187,6 +187,9 @@ private:
             itsFile.fail(shown(itsWord) + " is not a time");
         }
         itsTime = *time * itsTimescale.factor;
+        if (++itsIdleTimes > itsLimits.idleTimes) {
+            itsFile.fail("more than " + std::to_string(itsLimits.idleTimes) + " times without a further value");
+        }
     }
 
     void readVariable()
@@ -387,6 +390,7 @@ private:
         if (has && itsScopes.variables()[owner].net != variable.net) {
             failAboutOwner(itsScopes.variables()[owner], variable, place);
         }
+        itsIdleTimes = variable.value && !has ? 0 : itsIdleTimes;
         itsDump.values.set(place, variable.value ? static_cast<std::int16_t>(*variable.value) : Values::unknown);
         itsDump.lineOf(place) = variable.value ? variable.line : static_cast<std::uint32_t>(itsFile.number());
         owner = number;
@@ -407,10 +411,12 @@ private:
     const NameMap& itsMap;
     NameMap itsReals;  // to read real values by
     Dump& itsDump;
+    DumpLimits itsLimits;
     VcdScopes itsScopes;
     std::string_view itsRest;
     std::string_view itsWord;
-    std::size_t itsIdle = 0;  // words since the last variable or the first change at the last time
+    std::size_t itsIdle = 0;         // words since the last variable or the first change at the last time
+    std::uint64_t itsIdleTimes = 0;  // since a place has got a value
     Timescale itsTimescale;
     std::uint64_t itsTime = 0;                     // in the timescale's unit
     std::optional<std::uint64_t> itsTimeOfChange;  // of the last change
@@ -426,7 +432,13 @@ private:
 
 void readVcd(std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
 {
-    VcdReader(input, name, map, dump).read();
+    readVcdWithin({}, input, name, map, dump);
+}
+
+void readVcdWithin(
+    const DumpLimits& limits, std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
+{
+    VcdReader(input, name, map, dump, limits).read();
     completeTwins(name, map, dump);
 }
 

@@ -49,6 +49,38 @@ TEST_F(Compare, AgreesWithTheTraceOfTheModel)
     }
 }
 
+TEST_F(Compare, ReadsPackedDumps)
+{
+    writeBlock(40);
+    writeDump("none", 2, 1);
+    morvik.run({"trace", "block.csv", "--iterations", "4", "--format", "vcd", "--output", "trace.vcd"});
+    const auto shell = [this](const std::string& command) {
+        return std::system(("cd '" + morvik.directory() + "' && " + command).c_str());
+    };
+    ASSERT_EQ(shell("gzip rtl.csv && vcd2fst trace.vcd trace.fst && gzip trace.vcd && cp trace.fst unnamed && "
+                    "head -c 300 trace.vcd.gz >part.vcd.gz && head -c 1000 trace.fst >part.fst"),
+              0);
+    const auto compareWith = [this](const std::string& dump) {
+        return morvik.run({"compare", "--block", "block.csv", "--iterations", "4", "--dump", dump});
+    };
+    for (const std::string dump : {"rtl.csv.gz", "trace.vcd.gz", "trace.fst", "unnamed"}) {
+        const CommandResult result = compareWith(dump);
+        EXPECT_TRUE(has(result.out, "7448 of 7448 values: all equal to the model\n")) << result.err;
+        EXPECT_EQ(result.status, 0);
+    }
+    expectRefused(compareWith("part.vcd.gz"),
+                  "part.vcd.gz: cannot be unpacked by gzip: gzip: part.vcd.gz: unexpected end of file");
+    expectRefused(compareWith("part.fst"),
+                  "part.fst: cannot be unpacked by fst2vcd: Could not open 'part.fst', exiting.");
+    const std::string path = std::getenv("PATH");
+    ASSERT_EQ(setenv("PATH", "/nowhere", 1), 0);
+    const CommandResult withoutTool = compareWith("trace.fst");
+    ASSERT_EQ(setenv("PATH", path.c_str(), 1), 0);
+    expectRefused(withoutTool,
+                  "trace.fst: is an FST waveform, which fst2vcd reads (Debian package gtkwave), and fst2vcd cannot be "
+                  "started: No such file or directory");
+}
+
 TEST_F(Compare, TellsAWrongRecordFromAWrongValue)
 {
     writeBlock(512);

@@ -28,4 +28,15 @@ TEST(FileKind, TakesAnythingElseForAText)
     }
 }
 
+TEST(FileKind, KnowsWhatOtherProgramsUnpack)
+{
+    using morvik::base::Packing;
+    using morvik::base::packingOf;
+    EXPECT_EQ(packingOf("\x1F\x8B\x08"s), Packing::gzip);
+    EXPECT_EQ(packingOf("\0\0\0\0\0\0\0\x01\x49\0"s), Packing::fst);
+    EXPECT_EQ(packingOf("\xFE\0\0\0\0"s), Packing::fst);
+    EXPECT_EQ(packingOf("BZh91AY&SY"s), Packing::none);
+    EXPECT_EQ(packingOf("$date"s), Packing::none);
+}
+
 }  // namespace

@@ -103,6 +103,19 @@ TEST(VcdDump, RefusesTimesAndChangesWithoutAnEnd)
     expectEndlessRefused(readVcd, "r0.5 r\n", "dump:2000046" + message, vcd);
 }
 
+TEST(VcdDump, RefusesTimesThatBringNothingForEver)
+{
+    Endless content("#11\n1c\n#12\n0c\n", vcd);
+    std::istream input(&content);
+    Dump dump(2, 43);
+    try {
+        readVcdWithin({1000}, input, "dump", {}, dump);
+        FAIL() << "accepted";
+    } catch (const morvik::base::Error& error) {
+        EXPECT_STREQ(error.what(), "dump:2036: more than 1000 times without a further value");
+    }
+}
+
 TEST(VcdDump, ComesBackToAScope)
 {
     const Dump dump = read(readVcd,
