@@ -20,8 +20,7 @@ void DumpFile::expectNoneLacking(const std::set<std::string, std::less<>>& names
 {
     if (!names.empty()) {
         const std::string& first = *names.begin();
-        failAsAWhole("has no signal " + base::shown(first) + ", which the map calls " +
-                     passSignals[*map.signal(first)].name);
+        failAsAWhole("has no signal " + base::shown(first) + ", which the map calls " + map.meaningOf(first));
     }
 }
 
@@ -49,6 +48,26 @@ unsigned DumpFile::count(const std::string& what, std::string_view text, unsigne
              (first == 0 && value == count ? "; use a map if they count from 1" : ""));
     }
     return *value - first;
+}
+
+std::uint64_t DumpFile::blockNumber(std::string_view text, const NameMap& map) const
+{
+    const auto number = base::parseNumber<std::uint64_t>(text);
+    if (!number || *number < map.firstBlock) {
+        fail("block " + base::shown(text) + " is not allowed, expected an integer from " +
+             std::to_string(map.firstBlock));
+    }
+    return *number - map.firstBlock;
+}
+
+std::int16_t DumpFile::packedValue(std::string_view name, std::string_view digits) const
+{
+    auto value = base::parseNumber<std::int64_t>(digits, 2).value_or(0);
+    value -= digits[0] == '1' ? std::int64_t{1} << digits.size() : 0;
+    if (value < Values::smallest || value > Values::largest) {
+        fail(std::string(name) + ' ' + base::shown(digits) + " is not allowed, expected -2048 to 2047 eighths");
+    }
+    return static_cast<std::int16_t>(value);
 }
 
 std::int16_t DumpFile::value(std::string_view name, unsigned signal, std::string_view text, const NameMap& map) const

@@ -8,6 +8,7 @@
 #include <string>
 #include <string_view>
 
+#include "Dump.h"
 #include "NameMap.h"
 #include "base/LineReader.h"
 
@@ -30,8 +31,28 @@ public:
     /// Parses a number that counts from `first`, and returns it as 0 to `count` - 1.
     unsigned count(const std::string& what, std::string_view text, unsigned first, unsigned count) const;
 
+    /// Parses the number of a block, and returns it counted from 0.
+    std::uint64_t blockNumber(std::string_view text, const NameMap& map) const;
+
+    /// Parses binary digits in two's complement; the dump calls the vector around them `name`.
+    std::int16_t packedValue(std::string_view name, std::string_view digits) const;
+
     /// Parses a value of the signal in the form that the map gives; the dump calls the signal `name`.
     std::int16_t value(std::string_view name, unsigned signal, std::string_view text, const NameMap& map) const;
+};
+
+/// Receives a single dump.
+class OneDump : public DumpSink {
+public:
+    explicit OneDump(Dump& dump) : itsDump(dump) {}
+
+    Dump& dumpOf(std::uint64_t /*block*/) override
+    {
+        return itsDump;
+    }
+
+private:
+    Dump& itsDump;
 };
 
 }  // namespace morvik::comparison

@@ -2,31 +2,14 @@
 #include "NameMap.h"
 
 #include <algorithm>
-#include <array>
 #include <cmath>
 #include <utility>
 
-#include "Values.h"
-#include "base/Error.h"
-#include "base/Json.h"
 #include "base/Numbers.h"
-#include "base/Shown.h"
-#include "base/TextFile.h"
 
 namespace morvik::comparison {
 
 namespace {
-
-using base::Json;
-using base::shown;
-using base::shownValue;
-
-constexpr std::array<std::pair<const char*, NumberForm>, 6> numberForms = {{{"auto", NumberForm::automatic},
-                                                                            {"integer", NumberForm::integer},
-                                                                            {"unsigned", NumberForm::unsignedInteger},
-                                                                            {"real", NumberForm::real},
-                                                                            {"hex", NumberForm::hexadecimal},
-                                                                            {"binary", NumberForm::binary}}};
 
 /// A real number that is a multiple of an eighth.
 std::optional<std::int64_t> eighths(std::string_view text)
@@ -47,176 +30,46 @@ std::optional<std::int64_t> complement(std::optional<std::int64_t> digits, unsig
     return isNegative ? *digits - (std::int64_t{1} << bits) : *digits;
 }
 
-/// Reads the members of the object; errors name the file.
-class MapReader {
-public:
-    MapReader(const Json& object, std::string name) : itsObject(object), itsName(std::move(name)) {}
-
-    NameMap read() const
-    {
-        NameMap map;
-        for (const auto& [key, value] : itsObject.items()) {
-            readMember(key, value, map);
-        }
-        return map;
-    }
-
-private:
-    [[noreturn]] void fail(const std::string& what) const
-    {
-        throw base::Error(itsName + ": " + what);
-    }
-
-    void readMember(const std::string& key, const Json& value, NameMap& map) const
-    {
-        if (key == "signals") {
-            readSignals(value, map);
-        } else if (key == "columns") {
-            readColumns(value, map);
-        } else if (key == "numbers") {
-            map.numbers = numberForm(value);
-        } else if (key == "bits") {
-            readBits(value, map);
-        } else if (key == "first_half_iteration") {
-            map.firstPass = count(key, value, 0, 1);
-        } else if (key == "first_step") {
-            map.firstStep = count(key, value, 0, 1);
-        } else if (key == "valid") {
-            map.valid = text(key, value);
-            if (map.valid.empty()) {
-                fail("\"valid\" is empty");
-            }
-        } else {
-            fail(shown(key) +
-                 " is not a key of a map, expected columns, signals, numbers, bits, first_half_iteration, first_step "
-                 "or valid");
-        }
-    }
-
-    std::string text(const std::string& key, const Json& value) const
-    {
-        if (!value.is_string()) {
-            fail(shown(key) + " is no text");
-        }
-        return value.get<std::string>();
-    }
-
-    unsigned count(const std::string& key, const Json& value, unsigned first, unsigned last) const
-    {
-        if (!value.is_number_unsigned() || value.get<std::uint64_t>() < first || value.get<std::uint64_t>() > last) {
-            fail(shown(key) + " is " + shownValue(value) + ", expected an integer from " + std::to_string(first) +
-                 " to " + std::to_string(last));
-        }
-        return value.get<unsigned>();
-    }
-
-    NumberForm numberForm(const Json& value) const
-    {
-        for (const auto& [form, kind] : numberForms) {
-            if (value == form) {
-                return kind;
-            }
-        }
-        fail("\"numbers\" is " + shownValue(value) + ", expected auto, integer, unsigned, real, hex or binary");
-    }
-
-    static std::optional<unsigned> signalOf(const Json& name)
-    {
-        const auto* const found =
-            std::find_if(passSignals.begin(), passSignals.end(), [&](const Signal& each) { return name == each.name; });
-        return found == passSignals.end() ? std::nullopt
-                                          : std::optional<unsigned>(static_cast<unsigned>(found - passSignals.begin()));
-    }
-
-    void readBits(const Json& value, NameMap& map) const
-    {
-        constexpr unsigned fewest = 8;
-        constexpr unsigned most = 32;
-        if (!value.is_object()) {
-            map.bits.fill(count("bits", value, fewest, most));
-            return;
-        }
-        for (const auto& [name, bits] : value.items()) {
-            const auto signal = signalOf(name);
-            if (!signal) {
-                fail("bits of " + shown(name) + ", expected " + signalNames());
-            }
-            map.bits[*signal] = count(name, bits, fewest, most);
-        }
-    }
-
-    void readSignals(const Json& value, NameMap& map) const
-    {
-        if (!value.is_object()) {
-            fail("\"signals\" is not an object");
-        }
-        for (const auto& [theirs, ours] : value.items()) {
-            if (ours.is_array()) {
-                readTwins(theirs, ours, map);
-                continue;
-            }
-            const auto signal = signalOf(ours);
-            if (!signal && !ours.is_null()) {
-                fail("signal " + shown(theirs) + " is " + shownValue(ours) + ", expected " + signalNames() +
-                     ", and null");
-            }
-            map.signals[theirs] = signal.value_or(NameMap::leftOut);
-            if (signal) {
-                map.needed.insert(theirs);
-            }
-        }
-    }
-
-    void readTwins(const std::string& theirs, const Json& ours, NameMap& map) const
-    {
-        const auto signal = ours.size() == 2 ? signalOf(ours[0]) : std::nullopt;
-        if (!signal || twinOf(*signal) == *signal || signalOf(ours[1]) != twinOf(*signal)) {
-            fail("signal " + shown(theirs) +
-                 " is a list, expected two signals that are always equal: g0 and g3, or "
-                 "g1 and g2");
-        }
-        map.signals[theirs] = *signal;
-        map.needed.insert(theirs);
-        map.standIns[twinOf(*signal)] = theirs;
-    }
-
-    void readColumns(const Json& value, NameMap& map) const
-    {
-        if (!value.is_object()) {
-            fail("\"columns\" is not an object");
-        }
-        for (const auto& [key, theirs] : value.items()) {
-            std::string* const column = key == "half_iteration" ? &map.passColumn
-                                        : key == "step"         ? &map.stepColumn
-                                        : key == "signal"       ? &map.signalColumn
-                                        : key == "value"        ? &map.valueColumn
-                                                                : nullptr;
-            if (column == nullptr) {
-                fail("column " + shown(key) + ", expected half_iteration, step, signal or value");
-            }
-            *column = text(key, theirs);
-            map.namesRows = map.namesRows || key == "signal" || key == "value";
-        }
-    }
-
-    const Json& itsObject;
-    std::string itsName;
-};
-
 }  // namespace
+
+std::optional<unsigned> signalCalled(std::string_view name)
+{
+    const auto* const found =
+        std::find_if(passSignals.begin(), passSignals.end(), [&](const Signal& each) { return name == each.name; });
+    return found == passSignals.end() ? std::nullopt
+                                      : std::optional<unsigned>(static_cast<unsigned>(found - passSignals.begin()));
+}
 
 NameMap::NameMap() : bits()
 {
     bits.fill(passBits);
     for (unsigned i = 0; i < signalCount; ++i) {
-        signals[passSignals[i].name] = i;
+        Element element;
+        element.signal = i;
+        signals[passSignals[i].name] = {element};
     }
 }
 
-std::optional<unsigned> NameMap::signal(std::string_view name) const
+std::optional<NameMap::Found> NameMap::find(std::string_view name) const
 {
-    const auto found = signals.find(name);
-    return found == signals.end() ? std::nullopt : std::optional<unsigned>(found->second);
+    if (const auto found = signals.find(name); found != signals.end()) {
+        return Found{found->first, found->second};
+    }
+    for (const Pattern& pattern : patterns) {
+        if (const auto words = pattern.name.match(name)) {
+            Found found = {pattern.name.text(), {}};
+            for (const auto& [signal, element] : pattern.elements) {
+                const auto known = signalCalled(NamePattern::filled(signal, *words));
+                if (!known) {
+                    return std::nullopt;
+                }
+                found.elements.push_back(element);
+                found.elements.back().signal = *known;
+            }
+            return found;
+        }
+    }
+    return std::nullopt;
 }
 
 std::optional<std::int64_t> NameMap::number(std::string_view text, unsigned signal) const
@@ -266,14 +119,20 @@ std::string NameMap::expectedNumber(unsigned signal) const
     }
 }
 
-NameMap readNameMap(std::istream& input, const std::string& name)
+std::string NameMap::meaningOf(const std::string& name) const
 {
-    constexpr std::size_t largest = std::size_t{1} << 20;  // more than a map needs for every net of a core
-    const Json object = base::parseJson(base::readText(input, name, largest), name);
-    if (!object.is_object()) {
-        throw base::Error(name + ": not a map, expected a JSON object");
+    std::vector<unsigned> meant;
+    if (const auto found = signals.find(name); found != signals.end()) {
+        for (const Element& element : found->second) {
+            meant.push_back(element.signal);
+        }
+        std::sort(meant.begin(), meant.end());
+        meant.erase(std::unique(meant.begin(), meant.end()), meant.end());
+        return signalNames(meant);
     }
-    return MapReader(object, name).read();
+    const auto pattern = std::find_if(
+        patterns.begin(), patterns.end(), [&name](const Pattern& each) { return each.name.text() == name; });
+    return pattern == patterns.end() ? name : pattern->elements.front().first;
 }
 
 }  // namespace morvik::comparison

@@ -46,10 +46,19 @@ struct Timescale {
 
 class VcdReader {
 public:
-    VcdReader(std::istream& input, const std::string& name, const NameMap& map, Dump& dump, const DumpLimits& limits)
-        : itsFile(input, name), itsMap(map), itsDump(dump), itsLimits(limits), itsScopes(map)
+    VcdReader(std::istream& input,
+              const std::string& name,
+              const NameMap& map,
+              DumpSink& sink,
+              bool hasBlocks,
+              const DumpLimits& limits)
+        : itsFile(input, name),
+          itsMap(map),
+          itsSink(sink),
+          itsHasBlocks(hasBlocks),
+          itsLimits(limits),
+          itsScopes(map, hasBlocks)
     {
-        dump.waveform.emplace(dump.lines.size());
         itsReals.numbers = NumberForm::real;
     }
 
@@ -70,8 +79,6 @@ public:
         }
         endDeclarations();
         keepChanges();
-        itsDump.waveform->notes = itsScopes.notes();
-        itsDump.waveform->unit = itsTimescale.unit;
     }
 
 private:
@@ -209,8 +216,21 @@ private:
         if (variable.net == mostNets) {
             itsFile.fail("more than " + std::to_string(mostNets) + " identifiers");
         }
-        if (placed([&] { return itsScopes.declare(variable); })) {
-            itsScopes.variables().back().bits = itsFile.count("width", width, 1, 65536) + 1;
+        const std::size_t kept = placed([&] { return itsScopes.declare(variable); });
+        for (auto each = itsScopes.variables().end() - static_cast<std::ptrdiff_t>(kept);
+             each != itsScopes.variables().end();
+             ++each) {
+            setBits(*each, itsFile.count("width", width, 1, 65536) + 1);
+        }
+    }
+
+    void setBits(VcdVariable& variable, unsigned width) const
+    {
+        const Element& element = variable.element;
+        variable.bits = element.bits > 0 ? element.bits : width;
+        if (element.bits > 0 && element.lowest + element.bits > width) {
+            itsFile.fail(variable.name + " has " + std::to_string(width) + " bits, the map packs " +
+                         std::to_string(element.lowest + element.bits) + " or more in it");
         }
     }
 
@@ -225,7 +245,7 @@ private:
         return name;
     }
 
-    /// Chooses the variables to read, and finds the scopes that depend on them.
+    /// Chooses the variables to read, and finds the groups that depend on them.
     void endDeclarations()
     {
         if (itsIsDeclared) {
@@ -234,25 +254,28 @@ private:
         itsIsDeclared = true;
         itsFile.expectNoneLacking(itsScopes.lacking(), itsMap);
         placed([this] { itsScopes.choose(); });
-        const auto& scopes = itsScopes.scopes();
+        const auto& groups = itsScopes.groups();
         itsDependents.resize(itsScopes.variables().size());
-        itsHasChanged.resize(scopes.size());
-        for (unsigned scope = 0; scope < scopes.size(); ++scope) {
-            if (scopes[scope].signals.empty()) {
-                continue;
-            }
-            for (const unsigned each : {scopes[scope].pass, scopes[scope].step, scopes[scope].valid}) {
-                if (each != nobody) {
-                    itsDependents[each].push_back(scope);
+        itsHasChanged.resize(groups.size());
+        for (unsigned group = 0; group < groups.size(); ++group) {
+            const VcdGroup& each = groups[group];
+            itsHistories.emplace_back(itsMap.timings[each.timing].delay);
+            itsTicks.push_back(false);
+            for (const unsigned control : {each.pass, each.step, each.valid, each.clock, each.block}) {
+                if (control != nobody) {
+                    itsDependents[control].push_back(group);
                 }
             }
-            for (const unsigned each : scopes[scope].signals) {
-                itsDependents[each].push_back(scope);
-                itsDump.given[itsScopes.variables()[each].signal] = true;
+            for (const unsigned signal : each.signals) {
+                itsDependents[signal].push_back(group);
+                itsGiven[itsScopes.variables()[signal].element.signal] = true;
             }
         }
-        if (std::find(itsDump.given.begin(), itsDump.given.end(), true) == itsDump.given.end()) {
+        if (std::find(itsGiven.begin(), itsGiven.end(), true) == itsGiven.end()) {
             itsFile.fail("no variable of the dump is a known signal; use a map to name them");
+        }
+        if (!itsHasBlocks) {
+            beginBlock(0);
         }
         itsOfNet.resize(itsNets.size());
         for (unsigned variable = 0; variable < itsDependents.size(); ++variable) {
@@ -299,23 +322,43 @@ private:
     void change(unsigned number, std::string_view digits, bool isReal)
     {
         VcdVariable& variable = itsScopes.variables()[number];
-        variable.value = isReal ? realValue(variable, digits) : bitsValue(variable, digits);
+        const auto before = variable.value;
+        variable.value = isReal ? realValue(variable, digits) : bitsValue(variable, partOf(variable, digits));
         variable.line = static_cast<std::uint32_t>(itsFile.number());
-        for (const unsigned scope : itsDependents[number]) {
-            if (!itsHasChanged[scope]) {
-                itsHasChanged[scope] = true;
-                itsChanged.push_back(scope);
+        const bool rises = variable.role == Role::control && variable.value == 1 && before != 1;
+        variable.rises += rises ? 1U : 0U;
+        for (const unsigned group : itsDependents[number]) {
+            itsTicks[group] = itsTicks[group] || (rises && itsScopes.groups()[group].clock == number);
+            if (!itsHasChanged[group]) {
+                itsHasChanged[group] = true;
+                itsChanged.push_back(group);
             }
         }
+    }
+
+    /// The digits of an element of a packed vector. Omitted leading digits are 0, or unknown if the first one is.
+    std::string_view partOf(const VcdVariable& variable, std::string_view digits)
+    {
+        if (variable.element.bits == 0) {
+            return digits;
+        }
+        const std::size_t end = std::size_t{variable.element.lowest} + variable.element.bits;
+        if (digits.size() < end) {
+            itsExtended.assign(end - digits.size(),
+                               !digits.empty() && digitOf(digits[0]) == Digit::unknown ? 'x' : '0');
+            itsExtended += digits;
+            digits = itsExtended;
+        }
+        return digits.substr(digits.size() - end, variable.element.bits);
     }
 
     std::int64_t realValue(const VcdVariable& variable, std::string_view digits) const
     {
         const bool inEighths = variable.role == Role::signal;
-        const auto value = itsReals.number(digits, variable.signal);
+        const auto value = itsReals.number(digits, variable.element.signal);
         if (!value || (!inEighths && *value % 8 != 0)) {
             itsFile.fail(variable.name + ' ' + shown(digits) + " is not allowed, expected " +
-                         (inEighths ? itsReals.expectedNumber(variable.signal) : "an integer"));
+                         (inEighths ? itsReals.expectedNumber(variable.element.signal) : "an integer"));
         }
         return inEighths ? *value : *value / 8;
     }
@@ -345,31 +388,86 @@ private:
     void keepChanges()
     {
         std::sort(itsChanged.begin(), itsChanged.end());
-        for (const unsigned scope : itsChanged) {
-            keep(itsScopes.scopes()[scope]);
-            itsHasChanged[scope] = false;
+        for (const unsigned group : itsChanged) {
+            keep(group);
+            itsHasChanged[group] = false;
+            itsTicks[group] = false;
         }
         itsChanged.clear();
     }
 
-    /// The value of a pass, step or valid variable, if it is known.
+    /// The value of a variable that tells of places, if it is known.
     std::optional<std::int64_t> valueOf(unsigned variable) const
     {
         return itsScopes.variables()[variable].value;
     }
 
-    void keep(const VcdScope& scope)
+    void keep(unsigned number)
     {
-        const auto pass = valueOf(scope.pass);
-        const auto step = valueOf(scope.step);
-        if (!pass || !step || (scope.valid != nobody && valueOf(scope.valid).value_or(0) != 1)) {
+        const VcdGroup& group = itsScopes.groups()[number];
+        const bool isOfABlock = !itsHasBlocks || beginBlockOf(group);
+        const auto place = isOfABlock ? placeOf(number) : std::nullopt;
+        if (!place || (group.valid != nobody && valueOf(group.valid).value_or(0) != 1)) {
             return;
         }
-        const unsigned h =
-            itsFile.count("half-iteration", std::to_string(*pass), itsMap.firstPass, itsDump.values.passes());
-        const unsigned n = itsFile.count("step", std::to_string(*step), itsMap.firstStep, itsDump.values.steps());
-        for (const unsigned number : scope.signals) {
-            keepValue(number, {h, itsScopes.variables()[number].signal, n});
+        for (const unsigned signal : group.signals) {
+            if (const auto own = itsDump->placeOf(*place, itsScopes.variables()[signal].element)) {
+                keepValue(signal, *own);
+            }
+        }
+    }
+
+    /// Where the group's values belong: now, or before a delay.
+    std::optional<StepPlace> placeOf(unsigned number)
+    {
+        const VcdGroup& group = itsScopes.groups()[number];
+        const Timing& timing = itsMap.timings[group.timing];
+        const auto pass = valueOf(group.pass);
+        const auto step = valueOf(group.step);
+        std::optional<StepPlace> place;
+        if (pass && step) {
+            const Values& values = itsDump->values;
+            place = {itsFile.count("half-iteration", std::to_string(*pass), itsMap.firstPass, values.passes()),
+                     itsFile.count("step", std::to_string(*step), itsMap.firstStep, values.steps())};
+        }
+        if (timing.delay == 0) {
+            return place;
+        }
+        PlaceHistory& history = itsHistories[number];
+        if (!timing.countsClocks) {
+            history.follow(place);
+        } else if (itsTicks[number]) {
+            history.begin(place);
+        } else {
+            history.settle(place);
+        }
+        return history.delayed();
+    }
+
+    /// Goes to the block of the group's values; false if it is unknown or has not begun.
+    bool beginBlockOf(const VcdGroup& group)
+    {
+        const VcdVariable& variable = itsScopes.variables()[group.block];
+        if (!itsMap.start.empty()) {
+            if (variable.rises > 0) {
+                beginBlock(variable.rises - 1);
+            }
+            return variable.rises > 0;
+        }
+        if (variable.value) {
+            beginBlock(itsFile.blockNumber(std::to_string(*variable.value), itsMap));
+        }
+        return variable.value.has_value();
+    }
+
+    void beginBlock(std::uint64_t block)
+    {
+        itsDump = &itsSink.dumpOf(block);
+        if (!itsDump->waveform) {
+            itsDump->waveform.emplace(itsDump->lines.size());
+            itsDump->waveform->notes = itsScopes.notes();
+            itsDump->waveform->unit = itsTimescale.unit;
+            itsDump->given = itsGiven;
         }
     }
 
@@ -377,9 +475,9 @@ private:
     void keepValue(unsigned number, const Place& place)
     {
         const VcdVariable& variable = itsScopes.variables()[number];
-        Waveform& waveform = *itsDump.waveform;
-        unsigned& owner = waveform.variables[itsDump.values.index(place)];
-        const bool has = itsDump.values.has(place);
+        Waveform& waveform = *itsDump->waveform;
+        unsigned& owner = waveform.variables[itsDump->values.index(place)];
+        const bool has = itsDump->values.has(place);
         if (!variable.value && has) {
             return;
         }
@@ -387,17 +485,22 @@ private:
             itsFile.fail(variable.name + ' ' + std::to_string(*variable.value) +
                          " is not allowed, expected -2048 to 2047 eighths");
         }
-        if (has && itsScopes.variables()[owner].net != variable.net) {
+        if (has && !isSameSource(itsScopes.variables()[owner], variable)) {
             failAboutOwner(itsScopes.variables()[owner], variable, place);
         }
         itsIdleTimes = variable.value && !has ? 0 : itsIdleTimes;
-        itsDump.values.set(place, variable.value ? static_cast<std::int16_t>(*variable.value) : Values::unknown);
-        itsDump.lineOf(place) = variable.value ? variable.line : static_cast<std::uint32_t>(itsFile.number());
+        itsDump->values.set(place, variable.value ? static_cast<std::int16_t>(*variable.value) : Values::unknown);
+        itsDump->lineOf(place) = variable.value ? variable.line : static_cast<std::uint32_t>(itsFile.number());
         owner = number;
-        waveform.times[itsDump.values.index(place)] = itsTime;
+        waveform.times[itsDump->values.index(place)] = itsTime;
         if (std::string& name = waveform.names[number]; name.empty()) {
             name = itsScopes.pathOf(variable);
         }
+    }
+
+    static bool isSameSource(const VcdVariable& one, const VcdVariable& other)
+    {
+        return one.net == other.net && one.element.lowest == other.element.lowest;
     }
 
     [[noreturn]] void failAboutOwner(const VcdVariable& one, const VcdVariable& other, const Place& place) const
@@ -410,7 +513,9 @@ private:
     DumpFile itsFile;
     const NameMap& itsMap;
     NameMap itsReals;  // to read real values by
-    Dump& itsDump;
+    DumpSink& itsSink;
+    Dump* itsDump = nullptr;  // of the block at hand
+    bool itsHasBlocks;
     DumpLimits itsLimits;
     VcdScopes itsScopes;
     std::string_view itsRest;
@@ -423,9 +528,13 @@ private:
     bool itsIsDeclared = false;
     std::map<std::string, unsigned, std::less<>> itsNets;  // by identifier
     std::vector<std::vector<unsigned>> itsOfNet;           // variables to read
-    std::vector<std::vector<unsigned>> itsDependents;      // scopes that depend on a variable
-    std::vector<unsigned> itsChanged;                      // scopes, since the last time
+    std::vector<std::vector<unsigned>> itsDependents;      // groups that depend on a variable
+    std::vector<PlaceHistory> itsHistories;                // of the groups
+    std::vector<bool> itsTicks;                            // whether the clock of a group has risen
+    std::vector<unsigned> itsChanged;                      // groups, since the last time
     std::vector<bool> itsHasChanged;
+    std::array<bool, signalCount> itsGiven = {};
+    std::string itsExtended;  // digits of a packed vector
 };
 
 }  // namespace
@@ -438,8 +547,14 @@ void readVcd(std::istream& input, const std::string& name, const NameMap& map, D
 void readVcdWithin(
     const DumpLimits& limits, std::istream& input, const std::string& name, const NameMap& map, Dump& dump)
 {
-    VcdReader(input, name, map, dump, limits).read();
+    OneDump sink(dump);
+    VcdReader(input, name, map, sink, false, limits).read();
     completeTwins(name, map, dump);
+}
+
+void readVcdBlocks(std::istream& input, const std::string& name, const NameMap& map, DumpSink& sink)
+{
+    VcdReader(input, name, map, sink, true, {}).read();
 }
 
 }  // namespace morvik::comparison

@@ -13,12 +13,41 @@
 
 namespace morvik::comparison {
 
-VcdScopes::VcdScopes(const NameMap& map) : itsMap(map), itsLacking(map.needed)
+namespace {
+
+constexpr std::size_t longestOfPattern = 4096;  ///< of names that patterns match, with their scopes
+
+}  // namespace
+
+VcdScopes::VcdScopes(const NameMap& map, bool hasBlocks) : itsMap(map), itsHasBlocks(hasBlocks), itsLacking(map.needed)
 {
-    itsLongestName = std::max({map.passColumn.size(), map.stepColumn.size(), map.valid.size()});
-    for (const auto& [name, signal] : map.signals) {
+    for (const Timing& timing : map.timings) {
+        Controls controls;
+        controls.pass = controlOf(timing.pass);
+        controls.step = controlOf(timing.step);
+        controls.valid = controlOf(timing.valid);
+        controls.clock = timing.countsClocks ? controlOf(map.clock) : nobody;
+        controls.block = !hasBlocks ? nobody : controlOf(map.start.empty() ? map.blockColumn : map.start);
+        itsControls.push_back(controls);
+    }
+    itsControlVariables.resize(itsControlNames.size());
+    for (const auto& [name, elements] : map.signals) {
         itsLongestName = std::max(itsLongestName, name.size());
     }
+    for (const NameMap::Pattern& pattern : map.patterns) {
+        itsMostParts = std::max(itsMostParts, pattern.name.parts());
+    }
+}
+
+/// The number of a name that tells of places; nobody for an empty one.
+unsigned VcdScopes::controlOf(const std::string& name)
+{
+    if (name.empty()) {
+        return nobody;
+    }
+    itsLongestName = std::max(itsLongestName, name.size());
+    const auto number = static_cast<unsigned>(itsControlNames.size());
+    return itsControlNames.try_emplace(name, number).first->second;
 }
 
 void VcdScopes::enter(const std::string& name)
@@ -46,14 +75,17 @@ void VcdScopes::leave()
 }
 
 /// Calls use(name, whether it has scopes) with the variable's name, then with the scope around it prefixed, the next
-/// scope, and so on, up to the longest name in the map.
+/// scope, and so on, as far as a name or a pattern of the map may reach.
 template <class Use>
 void VcdScopes::forEachName(const VcdVariable& variable, Use use) const
 {
     std::string name = variable.name;
     use(name, false);
+    std::size_t parts = 1;
     for (unsigned scope = variable.scope; scope != nobody; scope = itsScopes[scope].parent) {
-        if (name.size() + itsScopes[scope].name.size() >= itsLongestName) {
+        const std::size_t length = name.size() + itsScopes[scope].name.size();
+        const bool mayMatchAPattern = ++parts <= itsMostParts && length <= longestOfPattern;
+        if (length >= itsLongestName && !mayMatchAPattern) {
             return;
         }
         name.insert(0, itsScopes[scope].name + '.');
@@ -61,93 +93,98 @@ void VcdScopes::forEachName(const VcdVariable& variable, Use use) const
     }
 }
 
-/// Finds the signal by the longest name in the map that matches the variable.
-void VcdScopes::findSignal(VcdVariable& variable, bool& found)
+/// Finds the elements by the longest name in the map that matches the variable.
+std::vector<Element> VcdScopes::findElements(VcdVariable& variable)
 {
-    std::optional<unsigned> signal;
+    std::vector<Element> elements;
     forEachName(variable, [&](const std::string& name, bool hasScopes) {
-        const auto known = itsMap.signal(name);
-        if (known) {
-            signal = known;
-            itsLacking.erase(name);
+        if (auto found = itsMap.find(name)) {
+            itsLacking.erase(found->name);
             variable.byPath = hasScopes;
+            elements = std::move(found->elements);
         }
     });
-    found = signal && *signal != NameMap::leftOut;
-    variable.signal = signal.value_or(0);
+    return elements;
 }
 
-bool VcdScopes::isCalled(const VcdVariable& variable, const std::string& name) const
+/// Whether the variable tells of places, which it then does for its scope.
+bool VcdScopes::takeControls(const VcdVariable& variable, unsigned number)
 {
-    bool found = false;
-    forEachName(variable, [&](const std::string& each, bool) { found = found || each == name; });
-    return found && !name.empty();
-}
-
-void VcdScopes::setRole(unsigned& member, unsigned number) const
-{
-    if (member != nobody && netOf(member) != netOf(number)) {
-        throw base::Error("two variables are " + base::shown(pathOf(itsVariables[number])));
+    std::set<unsigned> controls;
+    forEachName(variable, [&](const std::string& name, bool) {
+        if (const auto found = itsControlNames.find(name); found != itsControlNames.end()) {
+            controls.insert(found->second);
+        }
+    });
+    for (const unsigned each : controls) {
+        const auto [known, isNew] = itsControlVariables[each].try_emplace(variable.scope, number);
+        if (!isNew && netOf(known->second) != variable.net) {
+            throw base::Error("two variables are " + base::shown(pathOf(variable)));
+        }
+        known->second = number;
     }
-    member = number;
+    return !controls.empty();
 }
 
-bool VcdScopes::declare(VcdVariable variable)
+std::size_t VcdScopes::declare(VcdVariable variable)
 {
     if (itsScope == nobody) {
         throw base::Error("variable " + base::shown(variable.name) + " outside of all scopes");
     }
     variable.scope = itsScope;
-    bool isSignal = false;
-    findSignal(variable, isSignal);
-    variable.role = isCalled(variable, itsMap.passColumn)   ? Role::pass
-                    : isCalled(variable, itsMap.stepColumn) ? Role::step
-                    : isCalled(variable, itsMap.valid)      ? Role::valid
-                                                            : Role::signal;
-    if (variable.role == Role::signal && !isSignal) {
-        return false;
-    }
+    const std::vector<Element> elements = findElements(variable);
     const auto number = static_cast<unsigned>(itsVariables.size());
-    itsVariables.push_back(variable);
-    VcdScope& scope = itsScopes[itsScope];
-    switch (variable.role) {
-    case Role::pass:
-        setRole(scope.pass, number);
-        break;
-    case Role::step:
-        setRole(scope.step, number);
-        break;
-    case Role::valid:
-        setRole(scope.valid, number);
-        break;
-    default:
-        scope.signals.push_back(number);
+    if (takeControls(variable, number)) {
+        variable.role = Role::control;
+        itsVariables.push_back(variable);
+        return 1;
     }
-    return true;
+    for (const Element& each : elements) {
+        variable.element = each;
+        itsScopes[itsScope].signals.push_back(static_cast<unsigned>(itsVariables.size()));
+        itsVariables.push_back(variable);
+    }
+    return elements.size();
 }
 
 /// Enclosing scopes come first in the list.
-void VcdScopes::inheritPlaces()
+void VcdScopes::inheritControls()
 {
-    for (VcdScope& scope : itsScopes) {
-        if (scope.parent != nobody) {
-            const VcdScope& around = itsScopes[scope.parent];
-            scope.pass = scope.pass == nobody ? around.pass : scope.pass;
-            scope.step = scope.step == nobody ? around.step : scope.step;
-            scope.valid = scope.valid == nobody ? around.valid : scope.valid;
+    for (const std::map<unsigned, unsigned>& own : itsControlVariables) {
+        std::vector<unsigned>& all = itsInherited.emplace_back(itsScopes.size(), nobody);
+        for (std::size_t scope = 0; scope < itsScopes.size(); ++scope) {
+            const unsigned parent = itsScopes[scope].parent;
+            const auto found = own.find(static_cast<unsigned>(scope));
+            all[scope] = found != own.end() ? found->second : parent != nobody ? all[parent] : nobody;
         }
     }
+}
+
+/// The variables that tell the place of a signal; the group has no signals.
+VcdGroup VcdScopes::groupOf(const VcdVariable& variable) const
+{
+    const Controls& controls = itsControls[variable.element.timing];
+    const auto inScope = [&](unsigned control) {
+        return control == nobody ? nobody : itsInherited[control][variable.scope];
+    };
+    VcdGroup group;
+    group.pass = inScope(controls.pass);
+    group.step = inScope(controls.step);
+    group.valid = inScope(controls.valid);
+    group.clock = inScope(controls.clock);
+    group.block = inScope(controls.block);
+    group.timing = variable.element.timing;
+    return group;
 }
 
 void VcdScopes::choose()
 {
-    inheritPlaces();
+    inheritControls();
     std::array<std::vector<unsigned>, signalCount> candidates;
     for (VcdScope& scope : itsScopes) {
         for (const unsigned number : scope.signals) {
-            candidates[itsVariables[number].signal].push_back(number);
+            candidates[itsVariables[number].element.signal].push_back(number);
         }
-        scope.signals.clear();
     }
     for (unsigned signal = 0; signal < signalCount; ++signal) {
         chooseSignal(signal, std::move(candidates[signal]));
@@ -161,8 +198,19 @@ void VcdScopes::chooseSignal(unsigned signal, std::vector<unsigned> candidates)
     expectOneOfEachPlace(candidates);
     for (const unsigned number : candidates) {
         expectPlaces(itsVariables[number]);
-        itsScopes[itsVariables[number].scope].signals.push_back(number);
+        addToGroup(number);
     }
+}
+
+void VcdScopes::addToGroup(unsigned number)
+{
+    const VcdVariable& variable = itsVariables[number];
+    const auto [place, isNew] =
+        itsGroupNumbers.try_emplace({variable.scope, variable.element.timing}, itsGroups.size());
+    if (isNew) {
+        itsGroups.push_back(groupOf(variable));
+    }
+    itsGroups[place->second].signals.push_back(number);
 }
 
 /// If the map names variables of a signal with their scopes, only those are meant.
@@ -183,24 +231,25 @@ void VcdScopes::preferPaths(unsigned signal, std::vector<unsigned>& candidates)
 void VcdScopes::joinNets(std::vector<unsigned>& candidates) const
 {
     const auto known = [this](unsigned variable) {
-        const VcdScope& scope = itsScopes[itsVariables[variable].scope];
-        return (scope.pass != nobody ? 1 : 0) + (scope.step != nobody ? 1 : 0) + (scope.valid != nobody ? 1 : 0);
+        const VcdGroup group = groupOf(itsVariables[variable]);
+        return (group.pass != nobody ? 1 : 0) + (group.step != nobody ? 1 : 0) + (group.valid != nobody ? 1 : 0);
     };
     std::map<unsigned, int> mostKnown;
     for (const unsigned each : candidates) {
         int& most = mostKnown[netOf(each)];
         most = std::max(most, known(each));
     }
-    std::set<std::array<unsigned, 4>> taken;
+    std::set<std::tuple<unsigned, unsigned, unsigned, std::array<unsigned, 3>>> taken;
     const auto isNotNeeded = [&](unsigned each) {
-        const VcdScope& scope = itsScopes[itsVariables[each].scope];
+        const Element& element = itsVariables[each].element;
         return known(each) < mostKnown[netOf(each)] ||
-               !taken.insert({netOf(each), netOf(scope.pass), netOf(scope.step), netOf(scope.valid)}).second;
+               !taken.insert({netOf(each), element.lowest, element.timing, placeNets(each)}).second;
     };
     candidates.erase(std::remove_if(candidates.begin(), candidates.end(), isNotNeeded), candidates.end());
 }
 
-/// Of two variables for one signal, neither may be in a scope around the other's or belong to the same steps.
+/// Of two variables for one signal, neither may be in a scope around the other's or belong to the same steps, unless
+/// the map gives them different timings.
 void VcdScopes::expectOneOfEachPlace(const std::vector<unsigned>& candidates) const
 {
     if (candidates.size() < 2) {
@@ -209,11 +258,11 @@ void VcdScopes::expectOneOfEachPlace(const std::vector<unsigned>& candidates) co
     std::vector<unsigned> around(itsScopes.size(), nobody);  // the candidate in or around a scope
     std::map<std::array<unsigned, 3>, unsigned> ofPlace;
     for (const unsigned each : candidates) {
-        const VcdScope& scope = itsScopes[itsVariables[each].scope];
         unsigned& inScope = around[itsVariables[each].scope];
-        const auto same = ofPlace.try_emplace({netOf(scope.pass), netOf(scope.step), netOf(scope.valid)}, each).first;
+        const auto same = ofPlace.try_emplace(placeNets(each), each).first;
         for (const unsigned other : {inScope, same->second}) {
-            if (other != nobody && netOf(other) != netOf(each)) {
+            if (other != nobody && netOf(other) != netOf(each) &&
+                itsVariables[other].element.timing == itsVariables[each].element.timing) {
                 failAboutTwo(*this, itsVariables[other], itsVariables[each]);
             }
         }
@@ -231,15 +280,35 @@ void VcdScopes::expectOneOfEachPlace(const std::vector<unsigned>& candidates) co
 
 void VcdScopes::expectPlaces(const VcdVariable& variable) const
 {
-    const VcdScope& scope = itsScopes[variable.scope];
-    const bool lacksValid = scope.valid == nobody && !itsMap.valid.empty();
-    if (scope.pass == nobody || scope.step == nobody || lacksValid) {
-        const std::string& name = scope.pass == nobody   ? itsMap.passColumn
-                                  : scope.step == nobody ? itsMap.stepColumn
-                                                         : itsMap.valid;
-        throw base::Error("no variable " + base::shown(name) + " in the scope of \"" + pathOf(variable) +
-                          "\" or around it");
+    const VcdGroup group = groupOf(variable);
+    const Timing& timing = itsMap.timings[group.timing];
+    const auto expect = [&](unsigned known, const std::string& name) {
+        if (known == nobody) {
+            throw base::Error("no variable " + base::shown(name) + " in the scope of \"" + pathOf(variable) +
+                              "\" or around it");
+        }
+    };
+    expect(group.pass, timing.pass);
+    expect(group.step, timing.step);
+    if (!timing.valid.empty()) {
+        expect(group.valid, timing.valid);
     }
+    if (timing.countsClocks) {
+        if (itsMap.clock.empty()) {
+            throw base::Error("a delay in clocks needs \"clock\" in the map");
+        }
+        expect(group.clock, itsMap.clock);
+    }
+    if (itsHasBlocks) {
+        expect(group.block, itsMap.start.empty() ? itsMap.blockColumn : itsMap.start);
+    }
+}
+
+/// The nets of the variables that tell where values belong.
+std::array<unsigned, 3> VcdScopes::placeNets(unsigned variable) const
+{
+    const VcdGroup group = groupOf(itsVariables[variable]);
+    return {netOf(group.pass), netOf(group.step), netOf(group.valid)};
 }
 
 unsigned VcdScopes::netOf(unsigned variable) const
@@ -260,7 +329,7 @@ std::string VcdScopes::pathOf(const VcdVariable& variable) const
 
 void failAboutTwo(const VcdScopes& scopes, const VcdVariable& one, const VcdVariable& other)
 {
-    const std::string signal = passSignals[other.signal].name;
+    const std::string signal = passSignals[other.element.signal].name;
     throw base::Error("two variables are " + signal + ", " + scopes.pathOf(one) + " and " + scopes.pathOf(other) +
                       "; a map chooses: {\"signals\": {\"" + scopes.pathOf(other) + "\": \"" + signal + "\"}}");
 }

@@ -191,7 +191,7 @@ TEST(CsvDump, RefusesAMapOfWhatItLacks)
     const std::string text = header + "0,0,llr,5\n";
     expectRefused(readCsv,
                   text,
-                  "dump: is CSV, where every row counts; \"valid\" in a map is for VCD",
+                  "dump:1: no column \"ok\" in the header \"half_iteration,step,signal,value\"",
                   mapOf(R"({"valid": "ok"})"));
     const std::string columns = "half_iteration,step,llr,ratio\n";
     const std::string lacking = "dump: has no signal \"ratios\", which the map calls extrinsic";
@@ -225,7 +225,7 @@ TEST(NameMap, NamesWhatIsWrong)
     expectMapRefused(R"({"bits": [[1]]})", "map.json: \"bits\" is a list, expected an integer from 8 to 32");
     expectMapRefused(R"({"signal": {}})",
                      "map.json: \"signal\" is not a key of a map, expected columns, signals, numbers, bits, "
-                     "first_half_iteration, first_step or valid");
+                     "first_half_iteration, first_step, first_block, valid, clock or start");
     expectMapRefused(R"({"signals": {"a": "alpha8"}})",
                      "map.json: signal \"a\" is \"alpha8\", expected intrinsic, g0 to g3, alpha0 to alpha7, beta0 to "
                      "beta7, llr, extrinsic, and null");
@@ -237,7 +237,7 @@ TEST(NameMap, NamesWhatIsWrong)
     }
     expectMapRefused(R"({"signals": 1})", "map.json: \"signals\" is not an object");
     expectMapRefused(R"({"columns": {"row": "x"}})",
-                     "map.json: column \"row\", expected half_iteration, step, signal or value");
+                     "map.json: column \"row\", expected half_iteration, step, signal, value or block");
     expectMapRefused(R"({"columns": {"step": 1}})", "map.json: \"step\" is no text");
     expectMapRefused(R"({"numbers": "octal"})",
                      "map.json: \"numbers\" is \"octal\", expected auto, integer, unsigned, real, hex or binary");
