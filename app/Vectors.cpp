@@ -3,6 +3,7 @@
 
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -17,8 +18,10 @@
 #include "base/Shown.h"
 #include "base/Text.h"
 #include "base/Thousandths.h"
+#include "ber/LinkOptions.h"
 #include "hardware/vectors/Set.h"
-#include "simulation/Point.h"
+#include "link/coding/CodeBlocks.h"
+#include "simulation/Plan.h"
 
 namespace morvik {
 
@@ -28,21 +31,33 @@ struct Options {
     std::string output;
     std::string checked;
     DecoderOptions decoder;
+    LinkOptions link;              ///< of transport blocks
+    std::optional<int> milliEbn0;  ///< as given, like
+    std::optional<int> milliEsn0;  ///< this one
     vectors::Settings settings;
 };
 
-template <class Value, class Text>
-std::string listed(const std::vector<Value>& values, Text textOf)
+/// What the random blocks are, as options that each follow a blank.
+std::string blockText(const Options& options)
 {
-    std::string list;
-    for (const Value& value : values) {
-        list += (list.empty() ? "" : ",") + textOf(value);
+    const vectors::Settings& settings = options.settings;
+    if (settings.transport.empty()) {
+        return " --block-size " + listed(settings.blockSizes, [](unsigned K) { return std::to_string(K); });
     }
-    return list;
+    return commandOf(options.link);
+}
+
+std::string noiseText(const Options& options)
+{
+    if (options.milliEsn0) {
+        return " --esn0 " + base::thousandthsText(*options.milliEsn0);
+    }
+    const bool isTold = options.milliEbn0 || options.settings.transport.empty();
+    return isTold ? " --ebn0 " + base::thousandthsText(options.settings.milliDecibels) : "";
 }
 
 /// The command that makes the set again, without the folder.
-std::string commandOf(const vectors::Settings& settings)
+std::string commandOf(const Options& options, const vectors::Settings& settings)
 {
     const auto itself = [](const std::string& text) {
         return text;
@@ -51,13 +66,13 @@ std::string commandOf(const vectors::Settings& settings)
         return std::to_string(value);
     };
     const auto algorithm = static_cast<unsigned>(settings.generics.C_ALGORITHM_TYPE);
-    std::string command = "morvik vectors --block-size " + listed(settings.blockSizes, number);
+    std::string command = "morvik vectors" + blockText(options);
     command += " --num-pu " + number(settings.generics.C_NUM_PU);
     command += " --algorithm " + simulation::algorithmName(algorithm);
     command += " --iterations " + number(settings.iterations);
     command += " --tag-width " + number(settings.generics.C_TAG_WIDTH);
     command += " --blocks " + number(settings.blocks);
-    command += " --ebn0 " + base::thousandthsText(settings.milliDecibels);
+    command += noiseText(options);
     command += " --seed " + number(settings.seed);
     command += settings.directed ? "" : " --no-directed";
     command += " --format " + listed(settings.formats, itself);
@@ -80,11 +95,50 @@ std::string blocksAndFormats(const vectors::Manifest& manifest)
 std::string comparedText(const vectors::Compared& compared)
 {
     return std::to_string(compared.tags) + " tags, " + std::to_string(compared.decisions) + " decisions, " +
-           std::to_string(compared.ratios) + " ratios, " + std::to_string(compared.internal) + " internal values";
+           std::to_string(compared.ratios) + " ratios, " + std::to_string(compared.internal) + " internal values" +
+           (compared.crcs > 0 ? ", " + std::to_string(compared.crcs) + " CRC results" : "");
 }
 
-int make(const Options& options)
+/// How transport blocks are sent, and in which noise. Throws base::Error for options that cannot be met.
+std::vector<simulation::Point> transportOf(const Options& options)
 {
+    const bool hasTransportBlocks = options.link.hasTransportBlocks();
+    if (!hasTransportBlocks &&
+        (options.milliEsn0 || !options.link.modulations.empty() || options.link.fading || options.link.demapper)) {
+        throw base::Error(
+            "--modulation, --channel, --demapper and --esn0 need transport blocks, by --transport-block-size or "
+            "--mcs: plain code blocks are sent over BPSK and Gaussian noise");
+    }
+    std::vector<simulation::LinkFormat> formats = formatsOf(options.link, !options.settings.blockSizes.empty());
+    if (!hasTransportBlocks) {
+        return {};
+    }
+    if (formats.size() > vectors::mostFormats) {
+        throw base::Error("the lists combine to " + std::to_string(formats.size()) + " formats, a set has " +
+                          std::to_string(vectors::mostFormats) + " at most");
+    }
+    const veltra_ip_morvik_v1_0_generics& generics = options.decoder.generics;
+    std::vector<simulation::Point> points;
+    for (simulation::LinkFormat& format : formats) {
+        format.mcs.reset();  // its sizes say the same
+        simulation::Sweep sweep;
+        sweep.formats = {format};
+        sweep.numPus = {static_cast<unsigned>(generics.C_NUM_PU)};
+        sweep.algorithms = {static_cast<unsigned>(generics.C_ALGORITHM_TYPE)};
+        sweep.scaleOptions = {std::nullopt};
+        sweep.iterations = {options.decoder.iterations};
+        sweep.axis = options.milliEbn0 ? simulation::Axis::ebn0 : simulation::Axis::esn0;
+        const std::vector<int> usual = usualMilliEsn0(format, link::codeBlocksOf(format.transportBlockSize).sizePlus);
+        sweep.milliDecibels = {options.milliEbn0.value_or(options.milliEsn0.value_or(usual[usual.size() / 2]))};
+        points.push_back(pointsOf(sweep).front());
+    }
+    return points;
+}
+
+int make(Options options)
+{
+    options.settings.transport = transportOf(options);
+    options.settings.milliDecibels = options.milliEbn0.value_or(options.settings.milliDecibels);
     vectors::Manifest manifest;
     manifest.version = MORVIK_VERSION;
     manifest.settings = options.settings;
@@ -93,7 +147,7 @@ int make(const Options& options)
     if (manifest.settings.blocks == 0 && !manifest.settings.directed) {
         throw base::Error("--blocks 0 and --no-directed together leave no block");
     }
-    manifest.command = commandOf(manifest.settings);
+    manifest.command = commandOf(options, manifest.settings);
     const vectors::Manifest made = vectors::makeSet(options.output, manifest);
     print(coreLine(made.settings.generics, made.settings.iterations) + base::visible(options.output) + ": " +
           blocksAndFormats(made) + '\n');
@@ -145,28 +199,44 @@ int run(const CLI::App& command, const Options& options)
         expectNoOtherThanCheck(command);
         return check(options.checked);
     }
-    if (options.output.empty() || options.settings.blockSizes.empty()) {
-        throw base::Error("--out and --block-size, or --check, are required; see 'morvik vectors --help'");
+    const bool hasBlocks = !options.settings.blockSizes.empty() || options.link.hasTransportBlocks();
+    if (options.output.empty() || !hasBlocks) {
+        throw base::Error(
+            "--out and --block-size, --transport-block-size or --mcs, or --check, are required; see 'morvik vectors "
+            "--help'");
     }
     return make(options);
 }
 
-void addBlockOptions(CLI::App& command, vectors::Settings& settings)
+/// Adds Eb/N0 or Es/N0.
+CLI::Option* addNoise(CLI::App& command,
+                      const std::string& name,
+                      std::optional<int>& value,
+                      const std::string& description)
 {
+    return command
+        .add_option_function<std::string>(
+            name, [name, &value](const std::string& text) { value = readMilliDecibels(name, text); }, description)
+        ->type_name("X");
+}
+
+void addBlockOptions(CLI::App& command, Options& options)
+{
+    vectors::Settings& settings = options.settings;
     addListOption(command, "--block-size", settings.blockSizes, appendBlockSize, "Block size K in bits")
         ->check(offer(blockSizeWords()))
         ->type_name("K[,K...]");
-    command.add_option("--blocks", settings.blocks, "Random blocks of each size")
+    addLinkOptions(command, options.link);
+    command.add_option("--blocks", settings.blocks, "Random blocks of each size, or transport blocks")
         ->transform(integerFrom(0, 1000000))
         ->type_name("N")
         ->capture_default_str();
-    command
-        .add_option_function<std::string>(
-            "--ebn0",
-            [&settings](const std::string& text) { settings.milliDecibels = readMilliDecibels("--ebn0", text); },
-            "Eb/N0 of the random blocks in dB")
-        ->type_name("X")
-        ->default_str("1");
+    CLI::Option* const ebn0 = addNoise(command,
+                                       "--ebn0",
+                                       options.milliEbn0,
+                                       "Eb/N0 of the random blocks in dB: 1 for plain code blocks, for transport "
+                                       "blocks where their error rates fall");
+    addNoise(command, "--esn0", options.milliEsn0, "Instead of --ebn0: Es/N0 of transport blocks")->excludes(ebn0);
     command
         .add_option_function<std::string>(
             "--seed",
@@ -215,7 +285,9 @@ constexpr char explanation[] =
     R"(The folder gets the tables 'blocks', 'stimulus' and 'expected', one file for each format, and
 manifest.json with all parameters and the SHA-256 of each file. Random blocks come first, then
 directed ones: extreme values, ties, sizes at which the division into segments and windows
-changes, extreme tags. docs/vectors.md describes the layout.
+changes, extreme tags. With transport blocks, random blocks are their code blocks as they come out
+of rate recovery after each transmission: punctured, repeated, combined, saturated, with filler
+bits. docs/vectors.md describes the layout.
 
 Exit status: 0 written, or no difference, 1 a difference was found, 2 bad input or usage.
 
@@ -236,7 +308,7 @@ Command addVectors(CLI::App& app)
     command->add_option("--check", options->checked, "Decode the vectors in this folder again, and compare")
         ->type_name("DIR")
         ->excludes(output);
-    addBlockOptions(*command, options->settings);
+    addBlockOptions(*command, *options);
     addDecoderOptions(*command, options->decoder);
     addFileOptions(*command, options->settings);
     command->footer(explanation);

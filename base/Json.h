@@ -36,6 +36,12 @@ public:
     /// Throws unless the value is an object. The value must outlive the members.
     JsonMembers(const Json& value, std::string place);
 
+    /// What messages about the object begin with.
+    const std::string& place() const
+    {
+        return itsPlace;
+    }
+
     bool has(const std::string& name) const;
 
     const Json& at(const std::string& name) const;

@@ -45,9 +45,14 @@ TransportSetting checked(const TransportSetting& setting)
 
 }  // namespace
 
+TransportFormat formatOf(const TransportSetting& setting)
+{
+    return {setting.bits, setting.codedBits, bitsPerSymbol(setting.symbols.modulation), 1, setting.softBufferSize};
+}
+
 TransportSource::TransportSource(const TransportSetting& setting, std::uint64_t seed, const SamplerForm& form)
     : itsSetting(checked(setting)),
-      itsCode({setting.bits, setting.codedBits, bitsPerSymbol(setting.symbols.modulation), 1, setting.softBufferSize}),
+      itsCode(formatOf(setting)),
       itsKey(pointKey(setting, seed)),
       itsRandomBits(itsKey, form),
       itsLink(setting.symbols, itsKey, form),

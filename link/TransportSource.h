@@ -26,6 +26,9 @@ struct TransportSetting {
     std::vector<double> scales;                 ///< steps for a ratio of 1, in each transmission; above 0
 };
 
+/// What is coded in a setting. Its modulation is sent on one layer.
+TransportFormat formatOf(const TransportSetting& setting);
+
 /// Code blocks of one size as the decoder takes them, one after the other.
 struct CodeBlockBatch {
     struct Place {

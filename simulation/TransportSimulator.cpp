@@ -24,7 +24,9 @@ std::vector<double> scalesOf(const Point& point)
     return scales;
 }
 
-link::TransportSetting settingOf(const Point& point)
+}  // namespace
+
+link::TransportSetting transportSettingOf(const Point& point)
 {
     const LinkFormat& format = point.link;
     link::TransportSetting setting;
@@ -38,8 +40,6 @@ link::TransportSetting settingOf(const Point& point)
     return setting;
 }
 
-}  // namespace
-
 TransportSimulator::TransportSimulator(const Plan& plan,
                                        const Point& point,
                                        Core& core,
@@ -48,7 +48,7 @@ TransportSimulator::TransportSimulator(const Plan& plan,
       itsPoint(point),
       itsCore(core),
       itsSmallCore(point.numPu, point.algorithm, instructionSet),
-      itsSource(settingOf(point), plan.seed),
+      itsSource(transportSettingOf(point), plan.seed),
       itsCheck(itsSource)
 {
 }

@@ -11,6 +11,9 @@
 
 namespace morvik::simulation {
 
+/// How a point sends and receives its transport blocks.
+link::TransportSetting transportSettingOf(const Point& point);
+
 class TransportSimulator : public PointSimulator {
 public:
     /// Plan, point and core must outlive the simulator.

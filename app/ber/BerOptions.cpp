@@ -396,6 +396,7 @@ void addBerOptions(CLI::App& command, BerOptions& options)
 {
     addSweepOptions(command, options.sweep);
     addLinkOptions(command, options.link);
+    addEarlyStop(command, options.link);
     addRuleOptions(command, options);
     addExecutionOptions(command, options);
     addPictureOptions(command, options.pictures);

@@ -1,4 +1,4 @@
-// LinkOptions: the arguments of `morvik ber` that say what is sent, and how.
+// LinkOptions: the arguments of `morvik ber` and `morvik vectors` that say what is sent, and how.
 #include "LinkOptions.h"
 
 #include <algorithm>
@@ -217,6 +217,10 @@ void addLinkOptions(CLI::App& command, LinkOptions& options)
         link::demappers,
         [](link::Demapper demapper) { return nameOf(demapper); },
         "max-log: by the nearest points; exact: by all");
+}
+
+void addEarlyStop(CLI::App& command, LinkOptions& options)
+{
     addChoice(command,
               "--early-stop",
               options.stopsEarly,

@@ -1,4 +1,4 @@
-// LinkOptions: the arguments of `morvik ber` that say what is sent, and how.
+// LinkOptions: the arguments of `morvik ber` and `morvik vectors` that say what is sent, and how.
 #ifndef MORVIK_APP_BER_LINKOPTIONS_H
 #define MORVIK_APP_BER_LINKOPTIONS_H
 
@@ -9,8 +9,11 @@
 
 namespace morvik {
 
-/// Adds the options, which set `options`.
+/// Adds the options of what is sent and how it is received up to the decoder, which set `options`.
 void addLinkOptions(CLI::App& command, LinkOptions& options);
+
+/// Adds --early-stop.
+void addEarlyStop(CLI::App& command, LinkOptions& options);
 
 /// The options as a command repeats them, each after a blank.
 std::string commandOf(const LinkOptions& options);

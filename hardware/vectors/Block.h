@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -11,8 +12,17 @@
 
 namespace morvik::vectors {
 
+/// Where a code block of a transport block comes from.
+struct Origin {
+    std::uint32_t format = 0;          ///< of Settings::transport
+    std::uint32_t transportBlock = 0;  ///< counted from the first of its format
+    std::uint32_t codeBlock = 0;
+    std::uint32_t transmissions = 1;  ///< that are combined
+};
+
 struct Stimulus {
-    std::string name;  ///< what the block is for
+    std::string name;              ///< what the block is for
+    std::optional<Origin> origin;  ///< if it comes out of rate recovery
     std::uint32_t K = 0;
     std::uint32_t tag = 0;
     std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic and both parities, K + 4 values each

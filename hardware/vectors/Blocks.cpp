@@ -2,12 +2,15 @@
 #include "Blocks.h"
 
 #include <algorithm>
+#include <set>
 #include <string>
 #include <utility>
 
+#include "Received.h"
 #include "hardware/testbench/SoftBlock.h"
 #include "link/FrameSource.h"
 #include "link/channel/DefaultScale.h"
+#include "link/coding/CodeBlocks.h"
 #include "rules/BlockSizes.h"
 #include "rules/Cut.h"
 #include "rules/SoftValues.h"
@@ -91,14 +94,21 @@ public:
 
     void takeFrame(const std::string& name, unsigned K, std::uint64_t frame, std::uint32_t tag)
     {
-        Stimulus stimulus{name, K, tag, received(K, frame).streams};
+        Stimulus stimulus{name, {}, K, tag, received(K, frame).streams};
+        itsTake(stimulus);
+    }
+
+    /// A code block as it comes out of rate recovery.
+    void takeReceived(Stimulus& stimulus)
+    {
+        stimulus.tag = nextTag();
         itsTake(stimulus);
     }
 
     /// A noiseless code word at full amplitude.
     void takeSaturated(unsigned K, std::uint64_t frame)
     {
-        Stimulus stimulus{"saturated_code_word", K, nextTag(), received(K, frame, noNoise).streams};
+        Stimulus stimulus{"saturated_code_word", {}, K, nextTag(), received(K, frame, noNoise).streams};
         for (std::vector<std::int8_t>& stream : stimulus.streams) {
             for (std::int8_t& value : stream) {
                 value = extreme(value > 0);
@@ -109,7 +119,7 @@ public:
 
     void takePattern(const NamedPattern& named, unsigned K)
     {
-        Stimulus stimulus{named.name, K, nextTag(), {}};
+        Stimulus stimulus{named.name, {}, K, nextTag(), {}};
         for (unsigned stream = 0; stream < stimulus.streams.size(); ++stream) {
             for (unsigned position = 0; position < K + rules::tailPositions; ++position) {
                 stimulus.streams[stream].push_back(named.pattern(stream, position, position >= K));
@@ -147,7 +157,7 @@ private:
 void takeDirected(const Settings& settings, Source& source)
 {
     std::uint64_t frame = firstDirectedFrame;
-    for (const unsigned K : settings.blockSizes) {
+    for (const unsigned K : sizesOf(settings)) {
         for (const NamedPattern& named : patterns) {
             source.takePattern(named, K);
         }
@@ -168,9 +178,25 @@ void takeDirected(const Settings& settings, Source& source)
 
 }  // namespace
 
+std::vector<unsigned> sizesOf(const Settings& settings)
+{
+    if (settings.transport.empty()) {
+        return settings.blockSizes;
+    }
+    std::set<unsigned> sizes;
+    for (const simulation::Point& point : settings.transport) {
+        const link::CodeBlocks blocks = link::codeBlocksOf(point.link.transportBlockSize);
+        for (const unsigned r : {0U, blocks.count - 1}) {  // smaller sizes come first
+            sizes.insert(blocks.size(r));
+        }
+    }
+    return {sizes.begin(), sizes.end()};
+}
+
 void forEachStimulus(const Settings& settings, const std::function<void(const Stimulus&)>& take)
 {
     Source source(settings, take);
+    forEachReceived(settings, [&source](Stimulus& stimulus) { source.takeReceived(stimulus); });
     for (const unsigned K : settings.blockSizes) {
         for (unsigned frame = 0; frame < settings.blocks; ++frame) {
             source.takeRandom(randomName, K, frame);

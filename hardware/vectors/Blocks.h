@@ -11,10 +11,13 @@
 
 namespace morvik::vectors {
 
-/// The name of random blocks.
+/// The name of plain random blocks.
 constexpr char randomName[] = "random";
 
-/// Calls `take` with each stimulus: the random blocks of each size, then the directed ones.
+/// The sizes of a set's random blocks: those of its transport blocks' code blocks, if it has any.
+std::vector<unsigned> sizesOf(const Settings& settings);
+
+/// Calls `take` with each stimulus: the random blocks of each size or format, then the directed ones.
 void forEachStimulus(const Settings& settings, const std::function<void(const Stimulus&)>& take);
 
 /// The sizes before and after each change in how a core with `units` processing units cuts blocks, for segments of up

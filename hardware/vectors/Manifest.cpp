@@ -2,8 +2,9 @@
 #include "Manifest.h"
 
 #include <algorithm>
-#include <cmath>
 
+#include "Received.h"
+#include "TransportJson.h"
 #include "base/Error.h"
 #include "base/Json.h"
 #include "base/Shown.h"
@@ -26,6 +27,9 @@ Json parametersOf(const Settings& settings)
     json["tag_width"] = settings.generics.C_TAG_WIDTH;
     json["iterations"] = settings.iterations;
     json["block_sizes"] = settings.blockSizes;
+    for (const simulation::Point& point : settings.transport) {
+        json["transport_formats"].push_back(formatJson(point));
+    }
     json["blocks"] = settings.blocks;
     json["ebn0_db"] = base::fromThousandths(settings.milliDecibels);
     json["seed"] = settings.seed;
@@ -34,6 +38,17 @@ Json parametersOf(const Settings& settings)
     json["separate_streams"] = settings.separateStreams;
     json["soft"] = settings.ratios;
     json["internal"] = settings.internal;
+    return json;
+}
+
+Json blockOf(const ManifestBlock& block)
+{
+    Json json = {
+        {"name", block.name}, {"block_size", block.K}, {"tag", block.tag}, {"expected_tag", block.expectedTag}};
+    if (block.origin) {
+        addOrigin(*block.origin, json);
+        json["crc"] = block.crcFits;
+    }
     return json;
 }
 
@@ -78,16 +93,17 @@ std::vector<unsigned> blockSizesFrom(const base::JsonMembers& json)
     return sizes;
 }
 
-int milliDecibelsFrom(const base::JsonMembers& json)
+std::vector<simulation::Point> transportFrom(const base::JsonMembers& json, const Settings& settings)
 {
-    constexpr double most = 50;
-    const double decibels = json.number("ebn0_db");
-    const bool isInRange = decibels >= -most && decibels <= most;
-    const int thousandths = isInRange ? static_cast<int>(std::lround(1000 * decibels)) : 0;
-    if (!isInRange || base::fromThousandths(thousandths) != decibels) {
-        json.refuse("ebn0_db", "expected -50 to 50 dB, with at most three decimals");
+    std::vector<simulation::Point> points;
+    const base::Json& list = json.list("transport_formats");
+    if (list.empty() || list.size() > mostFormats) {
+        json.refuse("transport_formats", "expected 1 to " + std::to_string(mostFormats) + " formats");
     }
-    return thousandths;
+    for (const base::Json& each : list) {
+        points.push_back(formatFrom({each, json.place() + ": format " + std::to_string(points.size())}, settings));
+    }
+    return points;
 }
 
 /// The settings of the set. What the core checks itself is not checked here.
@@ -107,14 +123,28 @@ Settings settingsOf(const base::JsonMembers& json)
         json.refuse("width", "expected 8 or 16");
     }
     settings.blockSizes = blockSizesFrom(json);
+    if (json.has("transport_formats")) {
+        settings.transport = transportFrom(json, settings);
+    }
     settings.blocks = word(json, "blocks");
-    settings.milliDecibels = milliDecibelsFrom(json);
+    settings.milliDecibels = milliDecibelsFrom(json, "ebn0_db", 50);
     settings.seed = json.integer("seed", 0, UINT64_MAX);
     settings.directed = json.flag("directed");
     settings.separateStreams = json.flag("separate_streams");
     settings.ratios = json.flag("soft");
     settings.internal = json.flag("internal");
     return settings;
+}
+
+ManifestBlock blockFrom(const base::JsonMembers& json)
+{
+    ManifestBlock block = {
+        json.text("name"), word(json, "block_size"), word(json, "tag"), word(json, "expected_tag"), {}, false};
+    if (block.name == receivedName) {
+        block.origin = originFrom(json);
+        block.crcFits = json.flag("crc");
+    }
+    return block;
 }
 
 /// The tables of a format, which must be those that it writes, apart from their rows.
@@ -182,8 +212,7 @@ std::string manifestText(const Manifest& manifest)
     json["parameters"] = parametersOf(manifest.settings);
     json["blocks"] = Json::array();
     for (const ManifestBlock& block : manifest.blocks) {
-        json["blocks"].push_back(
-            {{"name", block.name}, {"block_size", block.K}, {"tag", block.tag}, {"expected_tag", block.expectedTag}});
+        json["blocks"].push_back(blockOf(block));
     }
     json["formats"] = Json::array();
     for (const ManifestFormat& format : manifest.formats) {
@@ -211,9 +240,7 @@ Manifest parseManifest(const std::string& text, const std::string& fileName)
         manifest.formats.push_back(format);
     }
     for (const base::Json& each : members.list("blocks")) {
-        const base::JsonMembers block(each, fileName + ": block " + std::to_string(manifest.blocks.size()));
-        manifest.blocks.push_back(
-            {block.text("name"), word(block, "block_size"), word(block, "tag"), word(block, "expected_tag")});
+        manifest.blocks.push_back(blockFrom({each, fileName + ": block " + std::to_string(manifest.blocks.size())}));
     }
     if (manifest.formats.empty()) {
         throw base::Error(fileName + ": names no format");

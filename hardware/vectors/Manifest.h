@@ -3,6 +3,7 @@
 #define MORVIK_HARDWARE_VECTORS_MANIFEST_H
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -16,6 +17,8 @@ struct ManifestBlock {
     std::uint32_t K = 0;
     std::uint32_t tag = 0;
     std::uint32_t expectedTag = 0;
+    std::optional<Origin> origin;  ///< if it comes out of rate recovery,
+    bool crcFits = false;          ///< and whether the expected decisions fit its CRC
 };
 
 struct ManifestFile {

@@ -8,6 +8,7 @@
 #include "Blocks.h"
 #include "Checksum.h"
 #include "Core.h"
+#include "Received.h"
 #include "SetFolder.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
@@ -87,13 +88,53 @@ bool isNamed(const Stimulus& stimulus, const Expected& expected, const ManifestB
     return stimulus.K == named.K && stimulus.tag == named.tag && expected.tag == named.expectedTag;
 }
 
-void count(Compared& compared, const Expected& expected)
-{
-    ++compared.tags;
-    compared.decisions += expected.bits.size();
-    compared.ratios += expected.ratios.size();
-    compared.internal += std::uint64_t{expected.internal.size()} * passSignals.size();
-}
+/// Compares the blocks of a format with the model, and counts what is compared.
+class BlockCheck {
+public:
+    BlockCheck(const Manifest& manifest, Compared& compared)
+        : itsManifest(manifest),
+          itsCompared(compared),
+          itsReceived(countOfReceived(manifest.settings)),
+          itsCore(manifest.settings),
+          itsCrc(manifest.settings)
+    {
+    }
+
+    /// The first difference of the block of a number.
+    std::optional<std::string> differenceOf(std::size_t number, const Stimulus& stimulus, const Expected& expected)
+    {
+        if (auto difference = vectors::differenceOf(itsCore.expect(stimulus), expected)) {
+            return difference;
+        }
+        ++itsCompared.tags;
+        itsCompared.decisions += expected.bits.size();
+        itsCompared.ratios += expected.ratios.size();
+        itsCompared.internal += std::uint64_t{expected.internal.size()} * passSignals.size();
+        return number < itsReceived ? crcDifference(number, expected.bits) : std::nullopt;
+    }
+
+private:
+    std::optional<std::string> crcDifference(std::size_t number, const std::vector<std::uint8_t>& bits)
+    {
+        const Origin origin = originOf(itsManifest.settings, number);
+        if (bits.size() != sizeOf(itsManifest.settings, origin)) {
+            return std::nullopt;  // expectBlocks() tells
+        }
+        const bool fits = itsCrc.fits(origin, bits);
+        ++itsCompared.crcs;
+        if (fits == itsManifest.blocks[number].crcFits) {
+            return std::nullopt;
+        }
+        return std::string("the CRC ") + (fits ? "fits" : "fails") + ", " + manifestName + " says it " +
+               (fits ? "fails" : "fits");
+    }
+
+    const Manifest& itsManifest;
+    Compared& itsCompared;
+    std::uint64_t itsReceived;
+    Core itsCore;
+    CrcCheck itsCrc;
+};
 
 void expectRows(const std::string& folder, const ManifestFormat& format, const std::vector<std::uint64_t>& rows)
 {
@@ -106,42 +147,64 @@ void expectRows(const std::string& folder, const ManifestFormat& format, const s
     }
 }
 
-/// Checks that the random blocks have the sizes that the parameters give, one size after the other.
-void expectSizes(const std::string& folder, const Manifest& manifest)
+/// What the block is, of a size as the manifest or a file tells it.
+std::string placeOf(const ManifestBlock& block, std::uint32_t K)
 {
-    std::size_t number = 0;
+    return block.name + (block.origin ? ", " + textOf(*block.origin) : "") + ", K = " + std::to_string(K);
+}
+
+/// Checks that the blocks of a name are those that the parameters give: `expected` of them, in their order.
+template <class IsRight>
+void expectBlocks(const std::string& folder,
+                  const Manifest& manifest,
+                  const std::string& name,
+                  std::uint64_t expected,
+                  IsRight expectRight)
+{
+    std::uint64_t found = 0;
     for (const ManifestBlock& block : manifest.blocks) {
-        if (block.name != randomName) {
-            continue;
+        found += block.name == name ? 1U : 0U;
+    }
+    if (found != expected) {
+        throw base::Error(manifestIn(folder) + ": names " + std::to_string(found) + ' ' + name +
+                          " blocks, its parameters make " + std::to_string(expected));
+    }
+    std::uint64_t number = 0;
+    for (const ManifestBlock& block : manifest.blocks) {
+        if (block.name == name) {
+            expectRight(block, number++);
         }
-        const unsigned size = manifest.settings.blockSizes[number / manifest.settings.blocks];
+    }
+}
+
+/// Checks that the blocks are those that the parameters give.
+void expectBlocks(const std::string& folder, const Manifest& manifest)
+{
+    const Settings& settings = manifest.settings;
+    const std::uint64_t random = std::uint64_t{settings.blocks} * settings.blockSizes.size();
+    const std::uint64_t received = countOfReceived(settings);
+    expectBlocks(folder, manifest, randomName, random, [&](const ManifestBlock& block, std::uint64_t number) {
+        const unsigned size = settings.blockSizes[static_cast<std::size_t>(number / settings.blocks)];
         if (block.K != size) {
             throw base::Error(manifestIn(folder) + ": names random block " + std::to_string(number) + " of " +
                               std::to_string(block.K) + " bits, its parameters make it " + std::to_string(size));
         }
-        ++number;
-    }
-}
-
-/// Checks that there are as many blocks as the parameters give.
-void expectBlocks(const std::string& folder, const Manifest& manifest)
-{
-    const Settings& settings = manifest.settings;
-    const auto random = static_cast<std::uint64_t>(
-        std::count_if(manifest.blocks.begin(), manifest.blocks.end(), [](const ManifestBlock& block) {
-            return block.name == randomName;
-        }));
-    const std::uint64_t expected = std::uint64_t{settings.blocks} * settings.blockSizes.size();
-    if (random != expected) {
-        throw base::Error(manifestIn(folder) + ": names " + std::to_string(random) +
-                          " random blocks, its parameters make " + std::to_string(expected));
-    }
-    if (settings.directed != (random < manifest.blocks.size())) {
+    });
+    expectBlocks(folder, manifest, receivedName, received, [&](const ManifestBlock& block, std::uint64_t number) {
+        const Origin origin = originOf(settings, number);
+        const ManifestBlock right = {receivedName, sizeOf(settings, origin), 0, 0, origin, false};
+        const std::string named = placeOf(block, block.K);
+        const std::string wanted = placeOf(right, right.K);
+        if (named != wanted) {
+            throw base::Error(manifestIn(folder) + ": names block " + std::to_string(number) + " as " + named +
+                              ", its parameters make it " + wanted);
+        }
+    });
+    if (settings.directed != (random + received < manifest.blocks.size())) {
         throw base::Error(manifestIn(folder) + ": names " +
                           (settings.directed ? "no directed block" : "directed blocks") + ", its parameters make " +
                           (settings.directed ? "some" : "none"));
     }
-    expectSizes(folder, manifest);
 }
 
 /// Refuses files of tables that the manifest does not name: they would be taken for checked.
@@ -173,7 +236,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
             throw base::Error(path + ": has changed since it was written: its sha256 differs from the manifest");
         }
     }
-    Core core(manifest.settings);
+    BlockCheck check(manifest, compared);
     BlockReader reader(folder, *tables::findFormat(format.name), manifest.settings);
     Stimulus stimulus;
     Expected expected;
@@ -182,15 +245,14 @@ std::optional<std::string> checkFormat(const std::string& folder,
         if (number == manifest.blocks.size()) {
             throw base::Error(manifestIn(folder) + ": names fewer blocks than " + format.name + " has");
         }
-        if (const auto difference = differenceOf(core.expect(stimulus), expected)) {
-            return format.name + ", block " + std::to_string(number) + " (" + manifest.blocks[number].name +
-                   ", K = " + std::to_string(stimulus.K) + "): " + *difference;
+        if (const auto difference = check.differenceOf(number, stimulus, expected)) {
+            return format.name + ", block " + std::to_string(number) + " (" +
+                   placeOf(manifest.blocks[number], stimulus.K) + "): " + *difference;
         }
         if (!isNamed(stimulus, expected, manifest.blocks[number])) {
             throw base::Error(manifestIn(folder) + ": has another size or tag of block " + std::to_string(number) +
                               " than " + format.name);
         }
-        count(compared, expected);
     }
     if (number < manifest.blocks.size()) {
         throw base::Error(manifestIn(folder) + ": names more blocks than " + format.name + " has");
@@ -209,12 +271,14 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
         writers.emplace_back(set.aside(), *tables::findFormat(name), manifest.settings);
     }
     Core core(manifest.settings);
+    CrcCheck crc(manifest.settings);
     forEachStimulus(manifest.settings, [&](const Stimulus& stimulus) {
         const Expected expected = core.expect(stimulus);
         for (BlockWriter& writer : writers) {
             writer.add(stimulus, expected);
         }
-        manifest.blocks.push_back({stimulus.name, stimulus.K, stimulus.tag, expected.tag});
+        const bool crcFits = stimulus.origin && crc.fits(*stimulus.origin, expected.bits);
+        manifest.blocks.push_back({stimulus.name, stimulus.K, stimulus.tag, expected.tag, stimulus.origin, crcFits});
     });
     for (std::size_t i = 0; i < writers.size(); ++i) {
         writers[i].finish();

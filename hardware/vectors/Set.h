@@ -21,6 +21,7 @@ struct Compared {
     std::uint64_t decisions = 0;
     std::uint64_t ratios = 0;
     std::uint64_t internal = 0;
+    std::uint64_t crcs = 0;
 };
 
 /// The result of checking a set.

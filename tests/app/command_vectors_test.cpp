@@ -109,6 +109,43 @@ TEST_F(Vectors, NamesTheCommandThatMakesTheSetAgain)
     EXPECT_EQ(nlohmann::json::parse(morvik.read("first/manifest.json"))["command"], expected);
 }
 
+TEST_F(Vectors, HoldTransportBlocksOfASimulation)
+{
+    const std::vector<std::string> link = {"--transport-block-size",
+                                           "6121",
+                                           "--code-rate",
+                                           "0.6",
+                                           "--modulation",
+                                           "16qam",
+                                           "--channel",
+                                           "rayleigh",
+                                           "--esn0",
+                                           "12"};
+    std::vector<std::string> arguments = {"--out", "set", "--format", "csv", "--blocks", "3", "--no-directed"};
+    arguments.insert(arguments.end(), link.begin(), link.end());
+    const CommandResult made = vectors(arguments);
+    ASSERT_EQ(made.status, 0) << made.err;
+    EXPECT_EQ(made.out, "core: 2 units, scaled, 8 iterations\nset: 6 blocks in csv\n");
+    EXPECT_EQ(
+        nlohmann::json::parse(morvik.read("set/manifest.json"))["command"],
+        "morvik vectors --transport-block-size 6121 --code-rate 0.6 --modulation 16qam --channel rayleigh --num-pu "
+        "2 --algorithm scaled --iterations 8 --tag-width 8 --blocks 3 --esn0 12 --seed 1 --no-directed --format "
+        "csv --width 8");
+    EXPECT_EQ(vectors({"--check", "set"}).out,
+              "core: 2 units, scaled, 8 iterations\nset: 6 blocks in csv, all as the model decodes them: 6 tags, 18624 "
+              "decisions, 0 ratios, 0 internal values, 6 CRC results\n");
+    // The second frame's code blocks are blocks 2 and 3 of the set, 0 and 1 of the file of a replay.
+    std::vector<std::string> replay = {"ber", "--replay", "0:1"};
+    replay.insert(replay.end(), link.begin(), link.end());
+    ASSERT_EQ(morvik.run(replay).status, 0);
+    std::istringstream rows(morvik.read("point0.frame1.csv"));
+    std::string expected;
+    for (std::string row; std::getline(rows, row);) {
+        expected += row[0] == 'b' ? "" : std::to_string(std::stoi(row) + 2) + row.substr(1) + '\n';
+    }
+    EXPECT_NE(morvik.read("set/stimulus.csv").find('\n' + expected + "4,"), std::string::npos);
+}
+
 TEST_F(Vectors, TellsADifference)
 {
     const CommandResult made =
@@ -127,7 +164,9 @@ TEST_F(Vectors, TellsADifference)
 TEST_F(Vectors, RefusesWhatIsNotAllowed)
 {
     const std::string help = "; see 'morvik vectors --help'";
-    const std::string required = "--out and --block-size, or --check, are required; see 'morvik vectors --help'";
+    const std::string required =
+        "--out and --block-size, --transport-block-size or --mcs, or --check, are required; see 'morvik vectors "
+        "--help'";
     expectRefused({}, required);
     expectRefused({"--out", "set"}, required);
     expectRefused({"--block-size", "40"}, required);
@@ -151,6 +190,14 @@ TEST_F(Vectors, RefusesWhatIsNotAllowed)
                   "--seed: \"-1\" is not allowed, expected an integer from 0 to 18446744073709551615" + help);
     expectRefused({"--out", "set", "--block-size", "40", "--blocks", "0", "--no-directed"},
                   "--blocks 0 and --no-directed together leave no block");
+    expectRefused({"--out", "set", "--block-size", "40", "--transport-block-size", "40", "--coded-bits", "120"},
+                  "--block-size sends plain code blocks, --transport-block-size transport blocks: only one of them can "
+                  "be given");
+    expectRefused({"--out", "set", "--block-size", "40", "--esn0", "3"},
+                  "--modulation, --channel, --demapper and --esn0 need transport blocks, by --transport-block-size or "
+                  "--mcs: plain code blocks are sent over BPSK and Gaussian noise");
+    expectRefused({"--out", "set", "--transport-block-size", "40", "--coded-bits", "121"},
+                  "--coded-bits 121 is no multiple of the 2 bits of --modulation qpsk, the nearest are 120 and 122");
     expectRefused({"--check", "nowhere"}, "nowhere/manifest.json: cannot be opened: No such file or directory");
 }
 

@@ -7,8 +7,11 @@
 #include <string>
 #include <vector>
 
+#include "VectorSet.h"
 #include "hardware/vectors/Blocks.h"
+#include "hardware/vectors/Core.h"
 #include "link/FrameSource.h"
+#include "support/PlainLink.h"
 
 namespace {
 
@@ -61,6 +64,123 @@ TEST(VectorBlocks, BeginWithTheFramesOfASimulation)
         EXPECT_EQ(stimuli[i].streams, frames.streams) << i;
     }
     EXPECT_NE(stimuli[6].name, "random");
+}
+
+// ---- Transport blocks
+
+/// The transport block whose code blocks these decisions are, by clause 5.1.2.
+morvik::plain::Bits transportBlockOf(unsigned A, const std::vector<std::vector<std::uint8_t>>& codeBlocks)
+{
+    const morvik::plain::Segmentation cut = morvik::plain::segmentation(A);
+    morvik::plain::Bits bits;
+    for (std::size_t r = 0; r < codeBlocks.size(); ++r) {
+        const std::ptrdiff_t fillers = r == 0 ? static_cast<std::ptrdiff_t>(cut.F) : 0;
+        bits.insert(bits.end(), codeBlocks[r].begin() + fillers, codeBlocks[r].end() - (cut.C > 1 ? 24 : 0));
+    }
+    bits.resize(A);
+    return bits;
+}
+
+/// The soft values of a transport block's code blocks, one after the other, each stream after stream, if every value
+/// that a transmission brings is at an end of a soft buffer of `width` bits.
+std::vector<int> saturatedValues(const morvik::plain::Format& format,
+                                 const morvik::plain::Bits& block,
+                                 const std::vector<unsigned>& versions,
+                                 unsigned width)
+{
+    const morvik::plain::Segmentation cut = morvik::plain::segmentation(format.A);
+    std::vector<std::size_t> starts = {0};
+    for (unsigned r = 0; r < cut.C; ++r) {
+        starts.push_back(starts.back() + std::size_t{3} * (cut.size(r) + 4));
+    }
+    std::vector<int> values(starts.back());
+    for (unsigned k = 0; k < cut.F; ++k) {
+        values[k] = -128;
+        values[cut.size(0) + 4 + k] = -128;
+    }
+    const int end = 1 << (width - 1);
+    for (const unsigned version : versions) {
+        const morvik::plain::Bits coded = morvik::plain::encode(format, version, block);
+        const std::vector<morvik::plain::Place> places = morvik::plain::codedPlaces(format, version);
+        for (std::size_t i = 0; i < coded.size(); ++i) {
+            const std::size_t at = starts[places[i].r] + places[i].stream * (cut.size(places[i].r) + 4) + places[i].k;
+            values[at] = std::clamp(values[at] + (coded[i] != 0 ? end - 1 : -end), -end, end - 1);
+        }
+    }
+    return values;
+}
+
+/// Without noise, every value that arrives is at an end of a narrow soft buffer, so a second model of the standard's
+/// clauses tells all soft values: punctured, repeated, filler bits, combined.
+TEST(VectorBlocks, AreThoseOfTransportBlocksBehindRateRecovery)
+{
+    struct Case {
+        unsigned A, G, NIR, width;
+        std::vector<unsigned> versions;
+    };
+    for (const Case& each : {Case{16, 60, 0, 4, {0}},             // repeated: 8 symbols more than bits
+                             Case{41, 88, 0, 4, {0, 2}},          // with filler bits
+                             Case{104, 150, 0, 7, {0, 2, 3, 1}},  // punctured
+                             Case{6121, 6960, 12000, 6, {1, 0}},  // two code blocks, limited buffer
+                             Case{104, 1200, 250, 8, {3, 3}}}) {  // repeated beyond a limited buffer
+        SCOPED_TRACE(each.A);
+        morvik::simulation::LinkFormat format;
+        format.transportBlockSize = each.A;
+        format.codedBits = each.G;
+        format.modulation = morvik::link::Modulation::qpsk;
+        format.versions = each.versions;
+        format.softBufferBits = each.width;
+        format.softBufferSize = each.NIR;
+        Settings settings;
+        settings.transport = {morvik::support::transportPoint(format, 50000)};
+        settings.blocks = 2;
+        settings.directed = false;
+        const morvik::plain::Format plain = {each.A, each.G, 2, 1, each.NIR};
+        morvik::vectors::Core core(settings);
+        const std::vector<Stimulus> stimuli = stimuliOf(settings);
+        const std::size_t C = morvik::plain::segmentation(each.A).C;
+        ASSERT_EQ(stimuli.size(), 2 * each.versions.size() * C);
+        for (std::size_t first = 0; first < stimuli.size(); first += each.versions.size() * C) {
+            // After the last transmission, everything decodes.
+            std::vector<std::vector<std::uint8_t>> decided;
+            for (std::size_t r = 0; r < C; ++r) {
+                decided.push_back(core.expect(stimuli[first + (each.versions.size() - 1) * C + r]).bits);
+            }
+            const morvik::plain::Bits sent = transportBlockOf(each.A, decided);
+            for (std::size_t t = 0; t < each.versions.size(); ++t) {
+                std::vector<int> values;
+                for (std::size_t r = 0; r < C; ++r) {
+                    const Stimulus& stimulus = stimuli[first + t * C + r];
+                    EXPECT_EQ(stimulus.origin->transmissions, t + 1);
+                    EXPECT_EQ(stimulus.origin->codeBlock, r);
+                    for (const auto& stream : stimulus.streams) {
+                        values.insert(values.end(), stream.begin(), stream.end());
+                    }
+                }
+                const auto end = each.versions.begin() + static_cast<std::ptrdiff_t>(t) + 1;
+                EXPECT_EQ(values, saturatedValues(plain, sent, {each.versions.begin(), end}, each.width)) << t;
+            }
+        }
+    }
+}
+
+TEST(VectorBlocks, OfTransportBlocksHaveDirectedOnesOfTheirSizes)
+{
+    morvik::simulation::LinkFormat format;
+    format.transportBlockSize = 6121;
+    format.codedBits = 9000;
+    format.versions = {0};
+    Settings settings;
+    settings.transport = {morvik::support::transportPoint(format, 50000)};
+    settings.blocks = 1;
+    std::set<unsigned> sizes;
+    for (const Stimulus& stimulus : stimuliOf(settings)) {
+        EXPECT_EQ(stimulus.origin.has_value(), stimulus.name == "rate_recovered");
+        if (stimulus.name == "zeros") {
+            sizes.insert(stimulus.K);
+        }
+    }
+    EXPECT_EQ(sizes, (std::set<unsigned>{3072, 3136}));
 }
 
 TEST(VectorBlocks, CountTags)

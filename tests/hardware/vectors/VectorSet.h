@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <optional>
 #include <regex>
 #include <string>
 #include <vector>
@@ -13,6 +14,7 @@
 #include "base/Error.h"
 #include "hardware/vectors/Checksum.h"
 #include "hardware/vectors/Set.h"
+#include "simulation/Plan.h"
 #include "support/TemporaryFolder.h"
 
 namespace morvik::support {
@@ -22,6 +24,20 @@ using morvik::vectors::makeSet;
 using morvik::vectors::Manifest;
 using morvik::vectors::Settings;
 using morvik::vectors::sha256;
+
+/// Transport blocks in this format, at an Es/N0 in thousandths of a decibel.
+inline simulation::Point transportPoint(const simulation::LinkFormat& format, int milliEsn0)
+{
+    simulation::Sweep sweep;
+    sweep.formats = {format};
+    sweep.numPus = {2};
+    sweep.algorithms = {1};
+    sweep.scaleOptions = {std::nullopt};
+    sweep.iterations = {2};
+    sweep.axis = simulation::Axis::esn0;
+    sweep.milliDecibels = {milliEsn0};
+    return pointsOf(sweep).front();
+}
 
 /// Has a small set at hand, in a folder of its own.
 class VectorSet : public testing::Test {

@@ -40,6 +40,97 @@ TEST_F(VectorSet, IsAsTheModelDecodesWithAllDirectedBlocks)
     }
 }
 
+/// Two formats, one with filler bits, several code blocks and retransmissions.
+std::vector<morvik::simulation::Point> twoFormats()
+{
+    morvik::simulation::LinkFormat small;
+    small.transportBlockSize = 16;
+    small.codedBits = 90;
+    small.modulation = morvik::link::Modulation::qpsk;
+    small.versions = {0};
+    morvik::simulation::LinkFormat large = small;
+    large.transportBlockSize = 6121;
+    large.codedBits = 9000;
+    large.modulation = morvik::link::Modulation::qam16;
+    large.fading = morvik::link::Fading::symbol;
+    large.demapper = morvik::link::Demapper::exact;
+    large.versions = {0, 2};
+    large.softBufferBits = 6;
+    large.softBufferSize = 12000;
+    return {transportPoint(small, 3000), transportPoint(large, 9000)};
+}
+
+TEST_F(VectorSet, HasTheCodeBlocksOfTransportBlocksInEveryFormat)
+{
+    settings.blockSizes.clear();
+    settings.transport = twoFormats();
+    settings.internal = false;
+    const Manifest made = make();
+    ASSERT_EQ(made.blocks.size(), 2U + 2 * 2 * 2);
+    EXPECT_EQ(difference(), "none");
+    EXPECT_EQ(checkSet(path()).compared.crcs, 4U * 10);
+    const auto json = nlohmann::json::parse(read("manifest.json"));
+    EXPECT_EQ(
+        json["parameters"]["transport_formats"][1].dump(),
+        R"({"channel":"rayleigh","code_blocks":2,"coded_bits":9000,"demapper":"exact","esn0_db":9.0,"fillers":15,)"
+        R"("modulation":"16qam","redundancy_versions":[0,2],"scales":[3.239,3.239],"soft_buffer_bits":6,)"
+        R"("soft_buffer_size":12000,"transport_block_size":6121})");
+    EXPECT_EQ(json["blocks"][5].dump(),
+              R"({"block_size":3136,"code_block":1,"crc":true,"expected_tag":5,"format":1,"name":"rate_recovered",)"
+              R"("tag":5,"transmissions":2,"transport_block":0})");
+    EXPECT_FALSE(json["blocks"][2]["crc"].get<bool>()) << "after one transmission";
+}
+
+TEST_F(VectorSet, ChecksWhatTheManifestTellsOfTransportBlocks)
+{
+    settings.blockSizes.clear();
+    settings.transport = twoFormats();
+    settings.formats = {"csv"};
+    settings.internal = false;
+    make();
+    const auto good = nlohmann::ordered_json::parse(read("manifest.json"));
+    const auto differenceWith = [&](const auto& change) -> std::string {
+        auto json = good;
+        change(json);
+        folder.write("set/manifest.json", json.dump());
+        try {
+            return difference();
+        } catch (const morvik::base::Error& error) {
+            const std::string text = error.what();
+            return text.substr(text.find("manifest.json: ") + 15);
+        }
+    };
+    EXPECT_EQ(differenceWith([](auto& json) { json["blocks"][5]["crc"] = false; }),
+              "csv, block 5 (rate_recovered, transport block 0 of format 1, code block 1, 2 transmissions, K = 3136): "
+              "the CRC fits, manifest.json says it fails");
+    EXPECT_EQ(
+        differenceWith([](auto& json) { json["blocks"][5]["transport_block"] = 7; }),
+        "names block 5 as rate_recovered, transport block 7 of format 1, code block 1, 2 transmissions, K = 3136, "
+        "its parameters make it rate_recovered, transport block 0 of format 1, code block 1, 2 transmissions, "
+        "K = 3136");
+    EXPECT_EQ(differenceWith([](auto& json) { json["parameters"]["blocks"] = 3; }),
+              "names 10 rate_recovered blocks, its parameters make 15");
+    EXPECT_EQ(differenceWith([](auto& json) { json["blocks"][5].erase("crc"); }), "block 5: lacks \"crc\"");
+    const auto differenceWithFormat = [&](const std::string& name, const auto& value) {
+        return differenceWith([&](auto& json) { json["parameters"]["transport_formats"][1][name] = value; });
+    };
+    const std::string place = "parameters: format 1: ";
+    EXPECT_EQ(differenceWithFormat("coded_bits", 9001),
+              place +
+                  "\"coded_bits\" is 9001, 9001 coded bits are no multiple of the 4 bits of a symbol, 9000 and 9004 "
+                  "are");
+    EXPECT_EQ(differenceWithFormat("modulation", "8psk"),
+              place + "\"modulation\" is \"8psk\", expected a name that 'morvik vectors --help' lists");
+    EXPECT_EQ(differenceWithFormat("redundancy_versions", std::vector<int>{4}),
+              place + "\"redundancy_versions\" is a list, expected a list of numbers from 0 to 3");
+    EXPECT_EQ(differenceWithFormat("redundancy_versions", std::vector<int>{}),
+              place + "\"redundancy_versions\" is a list, expected 1 to 16 transmissions");
+    EXPECT_EQ(differenceWithFormat("soft_buffer_bits", 1),
+              place + "\"soft_buffer_bits\" is 1, expected 2 to 16, or 0 for full width");
+    EXPECT_EQ(differenceWith([](auto& json) { json["parameters"]["transport_formats"].clear(); }),
+              "parameters: \"transport_formats\" is a list, expected 1 to 1000 formats");
+}
+
 TEST_F(VectorSet, IsTheSameEachTime)
 {
     make();
