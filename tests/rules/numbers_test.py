@@ -1,6 +1,7 @@
 #!/usr/bin/env python3
-"""Every numbered rule of docs/arithmetic.md is found in rules/ where the document says, and rules/ names no other. Its headers
-need nothing of other folders, and nothing that allocates.
+"""Every numbered rule of docs/arithmetic.md is found in rules/ where the document says, and rules/ names no other. The other
+names that the document gives with a rule are those of the code. The headers of rules/ need nothing of other folders, and
+nothing that allocates.
 
   numbers_test.py SOURCES
 """
@@ -32,6 +33,19 @@ def described(document):
     return rules
 
 
+def named_places(document):
+    """The functions, members and files that the document names in brackets with the rules."""
+    for inside in re.findall(r"\((`rules/[^()]*)\)", document):
+        yield from re.findall(r"`([\w:./]+)`", inside)
+
+
+def is_in(place, sources):
+    """Whether a file, or the text of one, has the place."""
+    if "." in place:
+        return any(f"/{path}".endswith(f"/{place}") for path in sources)
+    return any(re.search(rf"\b{place.split('::')[-1]}\b", text) for text in sources.values())
+
+
 def comments(header):
     """The comment above each name that a header declares, and the header's own under the name ""."""
     head = re.match(r"(?://.*\n)+", header).group()
@@ -44,9 +58,12 @@ def comments(header):
 
 def main():
     sources = pathlib.Path(sys.argv[1])
-    rules = described((sources / "docs/arithmetic.md").read_text())
+    document = (sources / "docs/arithmetic.md").read_text()
+    rules = described(document)
     headers = {f"rules/{path.name}": path.read_text() for path in sorted((sources / "rules").glob("*.h"))}
-    faults = []
+    code = {path: path.read_text() for folder in ("rules", "lanes", "src") for path in (sources / folder).glob("*.*")}
+    faults = [f"docs/arithmetic.md names {place}, which the code lacks"
+              for place in named_places(document) if not is_in(place, code)]
     if sorted(rules) != list(range(1, RULES + 1)):
         faults.append(f"docs/arithmetic.md has the rules {sorted(rules)}")
     for number, places in rules.items():
