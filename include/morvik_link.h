@@ -27,11 +27,14 @@
  * @par Arrays
  *   All arrays are the caller's, of the size that a function states, in rows one after the other: with `blocks` blocks,
  *   "K values of each" means blocks * K values. Arrays that are read may not overlap those that are written. `blocks`
- * may be 0. Bits are bytes of 0 or 1, the first one sent first; of other bytes the lowest bit counts.
+ *   and `count` may be 0: an array without values may be null, and where nothing is to be done, the status is
+ *   MORVIK_LINK_OK unless another argument is wrong. Bits are bytes of 0 or 1, the first one sent first; of other bytes
+ *   the lowest bit counts.
  *
  * @par Log-likelihood ratios
  *   ln(P(1) / P(0)), as float: positive where 1 is the likelier bit, as with the core's soft values. They should be
- *   finite; NaN becomes the soft value -128. Results are the same bits on every machine.
+ *   finite; NaN becomes the soft value -128. A sum beyond the range of a float becomes infinite, and so the strongest
+ *   soft value. Results are the same bits on every machine.
  *
  * @par Statuses
  *   Functions return a status. On every status but MORVIK_LINK_OK nothing has been written, except that memory may run
@@ -61,7 +64,7 @@ extern "C" {
  * last, and the first that fails is told. */
 enum {
     MORVIK_LINK_OK = 0,
-    MORVIK_LINK_NULL_POINTER = 1,         /**< an array or record is null                                          */
+    MORVIK_LINK_NULL_POINTER = 1,         /**< an array or record is null, but for an array of no values           */
     MORVIK_LINK_TRANSPORT_BLOCK_SIZE = 2, /**< not 1 to 16777216                                                   */
     MORVIK_LINK_BLOCK_SIZE = 3,           /**< K is none of the 188 block sizes                                    */
     MORVIK_LINK_FILLERS = 4,              /**< as many filler bits as K, or more                                   */
@@ -255,12 +258,14 @@ MORVIK_LINK_API int32_t morvik_link_map(uint32_t bits_per_symbol, const uint8_t*
 /** Demappers: the nearest points alone, which is quick; or all points, exact but for the rounding of floats. */
 enum { MORVIK_LINK_MAX_LOG = 0, MORVIK_LINK_EXACT = 1 };
 
-/** The log-likelihood ratios of received symbols: gain * symbol + noise.
+/** The log-likelihood ratios of received symbols: gain * symbol + noise. They are finite: what is beyond the range of a
+ * float becomes the largest float of its sign. So weak a noise leaves the exact demapper nothing but the nearest
+ * points.
  *
  * @param bits_per_symbol    as above
  * @param demapper           MORVIK_LINK_MAX_LOG or MORVIK_LINK_EXACT
- * @param symbols            I and Q of each received symbol, its phase already turned back; one number for BPSK
- * @param gains              the channel's amplitude at each symbol, at least 0; or null where all are 1
+ * @param symbols            I and Q of each received symbol, finite, its phase already turned back; one number for BPSK
+ * @param gains              the channel's amplitude at each symbol, finite, at least 0; or null where all are 1
  * @param noise_variance     of I and Q together (N0), above 0; the one dimension of BPSK has half of it
  * @param count              number of symbols
  * @param ratios             receives count * bits_per_symbol ratios

@@ -44,6 +44,13 @@ bool anyNull(const Pointer*... pointers)
     return (... || (pointers == nullptr));
 }
 
+/// Whether one is null of arrays with values of `count` things; without any, they may be.
+template <typename... Pointer>
+bool anyNullOf(std::size_t count, const Pointer*... pointers)
+{
+    return count > 0 && anyNull(pointers...);
+}
+
 inline std::int32_t checkedCodeBlock(std::uint32_t K, std::uint32_t fillers)
 {
     return firstOf(unless(rules::findBlockSize(K) != nullptr, MORVIK_LINK_BLOCK_SIZE),

@@ -24,7 +24,7 @@ link::Modulation modulationOf(std::uint32_t bitsPerSymbol)
 template <std::uint32_t (*crc)(const std::uint64_t*, std::size_t, std::size_t)>
 std::int32_t writeParity(const std::uint8_t* bits, std::size_t count, std::uint8_t* parity)
 {
-    if (anyNull(bits, parity)) {
+    if (anyNull(parity) || anyNullOf(count, bits)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(MORVIK_LINK_OK, [=] {
@@ -42,7 +42,7 @@ std::int32_t deinterleave(std::uint32_t K,
                           Value filler,
                           const std::array<Value*, 3>& streams)
 {
-    if (anyNull(buffers, streams[0], streams[1], streams[2])) {
+    if (anyNullOf(blocks, buffers, streams[0], streams[1], streams[2])) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedCodeBlock(K, fillers), [=] {
@@ -119,7 +119,7 @@ std::int32_t morvik_link_turbo_encode(std::uint32_t K,
                                       std::uint8_t* par1,
                                       std::uint8_t* par2)
 {
-    if (anyNull(bits, sys, par1, par2)) {
+    if (anyNullOf(blocks, bits, sys, par1, par2)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedCodeBlock(K, 0), [=] {
@@ -155,7 +155,7 @@ std::int32_t morvik_link_rate_match(std::uint32_t K,
                                     std::size_t count,
                                     std::uint8_t* coded)
 {
-    if (anyNull(sys, par1, par2, coded)) {
+    if (anyNullOf(blocks, sys, par1, par2) || anyNullOf(std::min(blocks, count), coded)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version));
@@ -163,7 +163,7 @@ std::int32_t morvik_link_rate_match(std::uint32_t K,
         const link::RateMatching matching(K, fillers, unlimited(bufferSize));
         const std::size_t length = K + morvik::rules::tailPositions;
         std::vector<std::uint64_t> buffer(link::wordsOf(matching.size()));
-        std::vector<std::uint64_t> row(link::wordsOf(count));
+        std::vector<std::uint64_t> row(blocks > 0 ? link::wordsOf(count) : 0);
         for (std::size_t b = 0; b < blocks; ++b) {
             const std::array streams = {
                 packed(sys + b * length, length), packed(par1 + b * length, length), packed(par2 + b * length, length)};
@@ -195,7 +195,7 @@ std::int32_t morvik_link_rate_recover(std::uint32_t K,
                                       std::size_t count,
                                       float* buffers)
 {
-    if (anyNull(ratios, buffers)) {
+    if (anyNullOf(blocks, buffers) || anyNullOf(std::min(blocks, count), ratios)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version));
@@ -217,7 +217,7 @@ std::int32_t morvik_link_rate_recover_i16(std::uint32_t K,
                                           std::uint32_t width,
                                           std::int16_t* buffers)
 {
-    if (anyNull(steps, buffers)) {
+    if (anyNullOf(blocks, buffers) || anyNullOf(std::min(blocks, count), steps)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version), checkedWidth(width));
@@ -257,7 +257,7 @@ std::int32_t morvik_link_deinterleave_i8(std::uint32_t K,
 
 std::int32_t morvik_link_soft_values(const float* ratios, std::size_t count, float scale, std::int8_t* values)
 {
-    if (anyNull(ratios, values)) {
+    if (anyNullOf(count, ratios, values)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedPositive(scale, MORVIK_LINK_SCALE), [=] { link::softValues(ratios, count, scale, values); });
@@ -266,7 +266,7 @@ std::int32_t morvik_link_soft_values(const float* ratios, std::size_t count, flo
 std::int32_t morvik_link_soft_values_i16(
     const float* ratios, std::size_t count, float scale, std::uint32_t width, std::int16_t* values)
 {
-    if (anyNull(ratios, values)) {
+    if (anyNullOf(count, ratios, values)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedPositive(scale, MORVIK_LINK_SCALE), checkedWidth(width));
@@ -275,7 +275,7 @@ std::int32_t morvik_link_soft_values_i16(
 
 std::int32_t morvik_link_map(std::uint32_t bitsPerSymbol, const std::uint8_t* bits, std::size_t count, float* symbols)
 {
-    if (anyNull(bits, symbols)) {
+    if (anyNullOf(count, bits, symbols)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedBitsPerSymbol(bitsPerSymbol), [=] {
@@ -292,7 +292,7 @@ std::int32_t morvik_link_demap(std::uint32_t bitsPerSymbol,
                                std::size_t count,
                                float* ratios)
 {
-    if (anyNull(symbols, ratios)) {
+    if (anyNullOf(count, symbols, ratios)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status =
@@ -300,12 +300,12 @@ std::int32_t morvik_link_demap(std::uint32_t bitsPerSymbol,
                 unless(demapper == MORVIK_LINK_MAX_LOG || demapper == MORVIK_LINK_EXACT, MORVIK_LINK_DEMAPPER),
                 checkedPositive(noiseVariance, MORVIK_LINK_NOISE_VARIANCE));
     return guarded(status, [=] {
-        link::demapSymbols(modulationOf(bitsPerSymbol),
-                           demapper == MORVIK_LINK_EXACT ? link::Demapper::exact : link::Demapper::maxLog,
-                           symbols,
-                           gains,
-                           noiseVariance,
-                           count,
-                           ratios);
+        link::demapAnySymbols(modulationOf(bitsPerSymbol),
+                              demapper == MORVIK_LINK_EXACT ? link::Demapper::exact : link::Demapper::maxLog,
+                              symbols,
+                              gains,
+                              noiseVariance,
+                              count,
+                              ratios);
     });
 }

@@ -108,7 +108,7 @@ std::int32_t morvik_link_transport_encode(morvik_link_transport* transport,
                                           const std::uint8_t* bits,
                                           std::uint8_t* coded)
 {
-    if (anyNull(transport, bits, coded)) {
+    if (anyNull(transport) || anyNullOf(blocks, bits, coded)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedVersion(version), [=] {
@@ -139,7 +139,7 @@ std::int32_t morvik_link_transport_recover(const morvik_link_transport* transpor
                                            const float* ratios,
                                            float* buffers)
 {
-    if (anyNull(transport, ratios, buffers)) {
+    if (anyNull(transport) || anyNullOf(blocks, ratios, buffers)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedVersion(version), [=] {
@@ -157,7 +157,7 @@ std::int32_t morvik_link_transport_recover_i16(const morvik_link_transport* tran
                                                std::uint32_t width,
                                                std::int16_t* buffers)
 {
-    if (anyNull(transport, steps, buffers)) {
+    if (anyNull(transport) || anyNullOf(blocks, steps, buffers)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedVersion(version), checkedWidth(width));
@@ -178,7 +178,7 @@ std::int32_t morvik_link_transport_soft_values(const morvik_link_transport* tran
                                                std::int8_t* par1,
                                                std::int8_t* par2)
 {
-    if (anyNull(transport, buffers, sys, par1, par2)) {
+    if (anyNull(transport) || anyNullOf(blocks, buffers, sys, par1, par2)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedNumber(*transport, r), checkedPositive(scale, MORVIK_LINK_SCALE));
@@ -201,7 +201,7 @@ std::int32_t morvik_link_transport_soft_values_i16(const morvik_link_transport* 
                                                    std::int8_t* par1,
                                                    std::int8_t* par2)
 {
-    if (anyNull(transport, buffers, sys, par1, par2)) {
+    if (anyNull(transport) || anyNullOf(blocks, buffers, sys, par1, par2)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = checkedNumber(*transport, r);
@@ -224,7 +224,7 @@ std::int32_t morvik_link_transport_join(const morvik_link_transport* transport,
                                         std::uint8_t* bits,
                                         std::uint8_t* fits)
 {
-    if (anyNull(transport, decisions, bits)) {
+    if (anyNull(transport) || anyNullOf(blocks, decisions, bits)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(checkedNumber(*transport, r), [=] {
@@ -251,7 +251,7 @@ std::int32_t morvik_link_transport_check(const morvik_link_transport* transport,
                                          const std::uint8_t* bits,
                                          std::uint8_t* fits)
 {
-    if (anyNull(transport, bits, fits)) {
+    if (anyNull(transport) || anyNullOf(blocks, bits, fits)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     return guarded(MORVIK_LINK_OK, [=] {

@@ -37,6 +37,16 @@ void demapSymbols(Modulation modulation,
                   std::size_t count,
                   float* ratios);
 
+/// The same for any finite symbols and gains and any noise, where demapSymbols could leave the range of a float: such
+/// ratios become its ends.
+void demapAnySymbols(Modulation modulation,
+                     Demapper demapper,
+                     const float* symbols,
+                     const float* gains,
+                     float noiseVariance,
+                     std::size_t count,
+                     float* ratios);
+
 }  // namespace morvik::link
 
 #endif

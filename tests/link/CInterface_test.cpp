@@ -390,6 +390,61 @@ TEST(LinkInterfaceTest, RefusesArgumentsOfSteps)
               MORVIK_LINK_NOISE_VARIANCE);
 }
 
+TEST(LinkInterfaceTest, NothingIsDoneForNoBlocks)
+{
+    constexpr std::size_t huge = std::numeric_limits<std::size_t>::max() / 2 + 1;
+    std::uint8_t* const none = nullptr;
+    float* const f = nullptr;
+    std::int16_t* const steps = nullptr;
+    std::int8_t* const v = nullptr;
+    Bytes parity(24, 7);
+    for (const auto crc : {morvik_link_crc24a, morvik_link_crc24b}) {
+        EXPECT_EQ(crc(none, 0, parity.data()), MORVIK_LINK_OK);
+        EXPECT_EQ(parity, Bytes(24, 0));
+        EXPECT_EQ(crc(none, 0, none), MORVIK_LINK_NULL_POINTER);
+    }
+    EXPECT_EQ(morvik_link_turbo_encode(40, 0, none, none, none, none), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_rate_match(40, 0, 0, 0, 0, none, none, none, huge, none), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_rate_match(40, 0, 1, 0, 0, none, none, none, 1, none), MORVIK_LINK_BUFFER_SIZE);
+    EXPECT_EQ(morvik_link_rate_recover(40, 0, 0, 0, 0, f, huge, f), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_rate_recover(40, 0, 0, 4, 0, f, huge, f), MORVIK_LINK_REDUNDANCY_VERSION);
+    EXPECT_EQ(morvik_link_rate_recover(40, 0, 0, 0, 1, f, huge, f), MORVIK_LINK_NULL_POINTER);
+    EXPECT_EQ(morvik_link_rate_recover_i16(40, 0, 0, 0, 0, steps, huge, 6, steps), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_deinterleave(40, 0, 0, 0, f, 0, f, f, f), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_deinterleave_i8(40, 0, 0, 0, v, 0, v, v, v), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_soft_values(f, 0, 1, v), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_soft_values_i16(f, 0, 1, 6, steps), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_map(6, none, 0, f), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_demap(6, MORVIK_LINK_EXACT, f, f, 1, 0, f), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_demap(6, MORVIK_LINK_EXACT, f, f, 0, 0, f), MORVIK_LINK_NOISE_VARIANCE);
+    const Transport transport({7000, 14000, 2, 1, 0});
+    EXPECT_EQ(morvik_link_transport_encode(transport.get(), 0, 0, none, none), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_recover(transport.get(), 0, 0, f, f), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_recover_i16(transport.get(), 0, 0, steps, 6, steps), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_soft_values(transport.get(), 1, 0, f, 1, v, v, v), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_soft_values_i16(transport.get(), 1, 0, steps, v, v, v), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_join(transport.get(), 1, 0, none, none, none), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_check(transport.get(), 0, none, none), MORVIK_LINK_OK);
+    EXPECT_EQ(morvik_link_transport_check(nullptr, 0, none, none), MORVIK_LINK_NULL_POINTER);
+}
+
+TEST(LinkInterfaceTest, RatiosAreFinite)
+{
+    for (const std::uint32_t bits : {1U, 2U, 4U, 6U, 8U}) {
+        for (const std::int32_t demapper : {MORVIK_LINK_MAX_LOG, MORVIK_LINK_EXACT}) {
+            const Floats symbols = {0, 0.7F, -3e38F, 3e38F};
+            Floats ratios(4 / (bits == 1 ? 1 : 2) * bits);
+            for (const float variance : {1e-45F, 1e-38F, 1.0F}) {
+                ASSERT_EQ(morvik_link_demap(
+                              bits, demapper, symbols.data(), nullptr, variance, ratios.size() / bits, ratios.data()),
+                          MORVIK_LINK_OK);
+                EXPECT_TRUE(std::all_of(ratios.begin(), ratios.end(), [](float ratio) { return std::isfinite(ratio); }))
+                    << bits << ' ' << demapper << ' ' << variance;
+            }
+        }
+    }
+}
+
 TEST(LinkInterfaceTest, EveryStatusHasItsText)
 {
     std::set<std::string> texts;

@@ -6,6 +6,7 @@
 #include <array>
 #include <cmath>
 #include <cstring>
+#include <limits>
 #include <vector>
 
 #include "link/modulation/Mapper.h"
@@ -143,4 +144,62 @@ TEST(DemapperTest, GivesTheSameBitsOnEveryMachine)
         }
     }
     EXPECT_EQ(digest, 879404587039299059U);
+}
+
+TEST(DemapperTest, KeepsRatiosInTheRangeOfAFloat)
+{
+    constexpr float most = std::numeric_limits<float>::max();
+    constexpr float least = std::numeric_limits<float>::denorm_min();
+    const std::vector<float> numbers = {0, least, -1e-20F, 0.3F, -1, 1e15F, -1e19F, 1e30F, -most};
+    for (const Modulation modulation : morvik::link::modulations) {
+        const unsigned bits = bitsPerSymbol(modulation);
+        for (const float number : numbers) {
+            for (const float gain : {0.0F, 1e-38F, 1.0F, 1e19F, most}) {
+                for (const float N0 : {least, 1e-38F, 1.0F, most}) {
+                    const std::array<float, 4> symbols = {number, -number / 3, 0.1F, 0.2F};
+                    const std::array<float, 2> gains = {gain, 1};
+                    for (const Demapper demapper : morvik::link::demappers) {
+                        std::array<float, 16> ratios{};
+                        demapAnySymbols(modulation, demapper, symbols.data(), gains.data(), N0, 2, ratios.data());
+                        for (unsigned i = 0; i < bits; ++i) {
+                            ASSERT_TRUE(std::isfinite(ratios[i])) << number << ' ' << gain << ' ' << N0;
+                            const long double plain =
+                                plainRatio(modulation, Demapper::maxLog, symbols.data(), gain, N0, i);
+                            const long double clipped = std::fmin(std::fmax(plain, -1.0L * most), 1.0L * most);
+                            const long double reach = std::fmax(std::fabs(number), gain);
+                            const long double largest = reach * reach / N0;
+                            // Sums are rounded as floats where these hold them, otherwise as doubles.
+                            ASSERT_LE(std::fabs(ratios[i] - clipped),
+                                      4 + 1e-6L * (std::fabs(clipped) + std::fmin(largest, 1e35L)) + 1e-14L * largest)
+                                << nameOf(modulation) << ' ' << number << ' ' << gain << ' ' << N0 << ' ' << i;
+                        }
+                    }
+                }
+            }
+        }
+    }
+}
+
+TEST(DemapperTest, OneSymbolOutOfRangeLeavesTheOthersAsTheyAre)
+{
+    morvik::blocks::Random random(4);
+    for (const Modulation modulation : morvik::link::modulations) {
+        const unsigned bits = bitsPerSymbol(modulation);
+        Received received = randomSymbols(random, modulation, 30);
+        for (const Demapper demapper : morvik::link::demappers) {
+            std::vector<float> alone(std::size_t{30} * bits);
+            std::vector<float> among(alone.size());
+            const float* const gains = received.gains.data();
+            received.symbols.back() = 0.5F;
+            demapSymbols(modulation, demapper, received.symbols.data(), gains, 0.1F, 30, alone.data());
+            demapAnySymbols(modulation, demapper, received.symbols.data(), gains, 0.1F, 30, among.data());
+            EXPECT_EQ(among, alone);
+            received.symbols.back() = -3e38F;
+            demapAnySymbols(modulation, demapper, received.symbols.data(), gains, 0.1F, 30, among.data());
+            alone.resize(std::size_t{29} * bits);
+            EXPECT_GT(std::fabs(among.back() + among[among.size() - 2]), 1e30F);
+            among.resize(alone.size());
+            EXPECT_EQ(among, alone);
+        }
+    }
 }
