@@ -1,7 +1,7 @@
 # The layout of `cmake --install`: the libraries with their headers, CMake packages and pkg-config files, the command with
 # its manual pages and completions, and the pages of docs/. All paths are relative, so an installed tree can be moved. If
-# only the model is built, `cmake --install FOLDER --component library` installs it alone; so does `link` with the LTE
-# chain. packaging/ has Debian's layout.
+# only the model is built, `cmake --install FOLDER --component library` installs it alone; so do `link` with the LTE
+# chain and `checker`. packaging/ has Debian's layout.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 set(library morvik_v1_0_bitacc_cmodel)
@@ -11,7 +11,7 @@ set_target_properties(morvik_classes PROPERTIES EXPORT_NAME classes)
 install(TARGETS ${library} morvik_classes EXPORT ${library}
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
-install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} PATTERN morvik_link.h EXCLUDE)
+install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} PATTERN morvik_link.h EXCLUDE PATTERN morvik_checker.h EXCLUDE)
 install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 
 # The class headers and those that they include. Their names are common, so they have a folder of their own.
@@ -58,6 +58,12 @@ install(TARGETS morvik_link_c EXPORT morvik_link
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(FILES include/morvik_link.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT link)
 
+set_target_properties(morvik_checker_c PROPERTIES EXPORT_NAME morvik_checker)
+install(TARGETS morvik_checker_c EXPORT morvik_checker
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT checker
+    INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+install(FILES include/morvik_checker.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT checker)
+
 # What finds a library: a CMake package and a pkg-config file. A consumer of the other word size gets a message rather
 # than a linker error.
 cmake_path(RELATIVE_PATH CMAKE_INSTALL_PREFIX BASE_DIRECTORY ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig
@@ -74,3 +80,4 @@ function(install_finders name component)
 endfunction()
 install_finders(${library} library)
 install_finders(morvik_link link)
+install_finders(morvik_checker checker)

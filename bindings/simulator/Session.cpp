@@ -5,42 +5,23 @@
 #include <sstream>
 #include <utility>
 
+#include "base/OutputTurn.h"
 #include "bindings/Listener.h"
-#include "rules/BlockSizes.h"
+#include "hardware/testbench/SizeHint.h"
+#include "hardware/testbench/SoftBlock.h"
 
 namespace morvik::simulator {
-
-namespace {
-
-constexpr std::size_t tail = 4;
-constexpr std::size_t mostPositions = rules::blockSizes.back().K + tail;
-
-/// Held while the library's output is captured: its streams are process-wide.
-std::mutex turn;
-
-/// Explains an invalid size: how the caller may have come to it.
-std::string sizeHint(std::size_t positions)
-{
-    const std::string count = std::to_string(positions);
-    if (rules::findBlockSize(static_cast<std::uint32_t>(positions)) != nullptr) {
-        return ": " + count + " soft values in each stream, but a block of " + count + " bits has " +
-               std::to_string(positions + tail) + ", the tail included";
-    }
-    return ": " + count + " soft values in each stream are not K + 4 for a block size K of 3GPP TS 36.212";
-}
-
-}  // namespace
 
 Session::Session(int numPu, int algorithm, int tagWidth)
 {
     for (auto& stream : itsStreams) {
-        stream.resize(mostPositions);
+        stream.resize(maxPositions);
     }
     auto generics = veltra_ip_morvik_v1_0_get_default_generics();
     generics.C_NUM_PU = numPu;
     generics.C_ALGORITHM_TYPE = algorithm;
     generics.C_TAG_WIDTH = tagWidth;
-    const std::lock_guard<std::mutex> lock(turn);
+    const std::lock_guard<std::mutex> lock(base::outputTurn());
     const Listener listener;
     itsState = veltra_ip_morvik_v1_0_create_state(generics);
     queue(listener.text());
@@ -53,7 +34,7 @@ Session::~Session()
 
 void Session::put(int sys, int par1, int par2) noexcept
 {
-    if (itsPositions < mostPositions) {
+    if (itsPositions < maxPositions) {
         itsStreams[0][itsPositions] = sys;
         itsStreams[1][itsPositions] = par1;
         itsStreams[2][itsPositions] = par2;
@@ -71,7 +52,7 @@ int Session::decode(int iterations, std::uint32_t tag)
     } else if (positions == 0) {
         itsMessages.emplace_back(
             "ERROR:binding:The streams are empty, but a block of K bits has K + 4 soft values in each");
-    } else if (positions > mostPositions) {
+    } else if (positions > maxPositions) {
         itsMessages.push_back("ERROR:binding:Block size not supported" + sizeHint(positions));
     } else {
         status = simulate(positions, iterations, tag);
@@ -82,9 +63,9 @@ int Session::decode(int iterations, std::uint32_t tag)
 /// Results are stored last, so that running out of memory leaves none of them.
 int Session::simulate(std::size_t positions, int iterations, std::uint32_t tag)
 {
-    std::array<std::uint8_t, mostPositions> bits;
+    std::array<std::uint8_t, maxPositions> bits;
     veltra_ip_morvik_v1_0_outputs outputs{bits.data(), static_cast<std::uint32_t>(bits.size()), 0, itsTag};
-    const std::lock_guard<std::mutex> lock(turn);
+    const std::lock_guard<std::mutex> lock(base::outputTurn());
     const Listener listener;
     const int status = veltra_ip_morvik_v1_0_bitacc_simulate(itsState,
                                                              itsStreams[0].data(),

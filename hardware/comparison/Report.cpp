@@ -83,17 +83,35 @@ public:
     {
         addVerdictOnAll();
         addCoverage();
-        if (!itsComparison.first) {
-            return itsText;
+        if (itsComparison.first) {
+            itsText += '\n';
+            addFirst();
+            addCounts();
+            addExamined();
+            addFindings();
+        } else if (itsCompared.countsAlways) {
+            itsText += '\n';
+            addCounts();
         }
-        itsText += '\n';
-        addPlace(*itsComparison.first);
-        addValue(*itsComparison.first);
-        addContext(*itsComparison.first);
-        addInputs(*itsComparison.first);
-        addCounts();
+        return itsText;
+    }
+
+    std::string firstDifference()
+    {
+        addFirst();
         addFindings();
         return itsText;
+    }
+
+    std::string headline() const
+    {
+        const Place& place = *itsComparison.first;
+        return format("%s of half-iteration %u, step %u: expected %d, got %s",
+                      passSignals[place.signal].name,
+                      place.pass,
+                      place.step,
+                      itsModel.values.at(place),
+                      gotText(place).c_str());
     }
 
 private:
@@ -122,7 +140,7 @@ private:
             itsText += "  by the map: " + each + '\n';
         }
         for (const std::string& each : lacksOf(coverage)) {
-            itsText += "  not in the dump: " + each + '\n';
+            itsText += "  not" + inValues() + ": " + each + '\n';
         }
         if (coverage.isComplete() || itsCompared.isPartial) {
             return;
@@ -132,6 +150,20 @@ private:
             itsText += format("; for a simulation of fewer iterations, give --iterations %u", *coverage.iterations);
         }
         itsText += ".\n";
+    }
+
+    void addFirst()
+    {
+        const Place& place = *itsComparison.first;
+        addPlace(place);
+        addValue(place);
+        addContext(place);
+        addInputs(place);
+    }
+
+    std::string inValues() const
+    {
+        return std::string(" in ") + itsCompared.values;
     }
 
     /// Adds the variable and time of a value, if the dump is a waveform.
@@ -150,8 +182,9 @@ private:
     void addPlace(const Place& place)
     {
         const rules::Cut& cut = itsModel.cut;
-        itsText += "First difference, in the order of computation (" + itsCompared.name + ':' +
-                   std::to_string(itsDump.lineOf(place)) + "):\n";
+        const std::uint32_t line = itsDump.lineOf(place);
+        itsText += "First difference, in the order of computation (" + itsCompared.name +
+                   (line > 0 ? ':' + std::to_string(line) : "") + "):\n";
         itsText += format("  half-iteration  %u, on the %s code\n", place.pass, codeName(place.pass));
         const rules::StepPlace where = itsModel.cut.placeOf(place.step);
         const rules::Window window = cut.windowAt(place.step);
@@ -227,16 +260,16 @@ private:
         bool differ = false;
         bool known = true;
         for (const InputState& input : itsComparison.inputs) {
-            const char* const state = input.present == 0     ? "not in the dump"
+            const std::string state = input.present == 0     ? "not" + inValues()
                                       : input.different == 0 ? "agrees"
                                                              : "differs";
             const unsigned all = signalsOf(input.stage).count;
-            const std::string part = input.present > 0 && input.present < all ? " where it is in the dump" : "";
+            const std::string part = input.present > 0 && input.present < all ? " where it is" + inValues() : "";
             itsText += format("  input %-10s of half-iteration %u, step %u: %s%s\n",
                               nameOf(input.stage).c_str(),
                               input.pass,
                               input.step,
-                              state,
+                              state.c_str(),
                               part.c_str());
             differ = differ || input.different > 0;
             known = known && input.present == all;
@@ -254,7 +287,7 @@ private:
         } else if (known) {
             itsText += "All its inputs agree. At fault: " + operation + ".\n\n";
         } else {
-            itsText += "At fault: " + operation + ", or an operation before it that is not in the dump.\n\n";
+            itsText += "At fault: " + operation + ", or an operation before it that is not" + inValues() + ".\n\n";
         }
     }
 
@@ -305,16 +338,23 @@ private:
             itsText +=
                 count.first ? format("   half-iteration %u, step %u\n", count.first->pass, count.first->step) : "\n";
         }
-        itsText += itsComparison.inputsAreKnown ? "Faults are values that do not follow from their inputs in the dump; "
-                                                  "other differences are consequences.\n"
-                                                : "Without their inputs in the dump, faults cannot be told from "
-                                                  "consequences: only the first stage that differs is examined.\n";
+    }
+
+    /// Adds how faults were told from other differences.
+    void addExamined()
+    {
+        itsText += itsComparison.inputsAreKnown
+                       ? "Faults are values that do not follow from their inputs" + inValues() +
+                             "; other differences are consequences.\n"
+                       : "Without their inputs" + inValues() +
+                             ", faults cannot be told from consequences: only the first stage that differs is "
+                             "examined.\n";
         const auto agreesAllTheSame = [](const SignalCount& count) {
             return count.faults > 0 && count.different == 0;
         };
         if (std::any_of(itsComparison.signals.begin(), itsComparison.signals.end(), agreesAllTheSame)) {
-            itsText +=
-                "Where a fault is not a difference, the core had the right inputs, but the dump has wrong ones.\n";
+            itsText += std::string("Where a fault is not a difference, the core had the right inputs, but ") +
+                       itsCompared.values + " has wrong ones.\n";
         }
         itsText += '\n';
     }
@@ -350,7 +390,8 @@ private:
     {
         addUnknown();
         if (!itsCompared.otherRuns.empty()) {
-            itsText += "Found: the dump is what the model computes " + eitherOf(itsCompared.otherRuns) + ".\n";
+            itsText += std::string("Found: ") + itsCompared.values + " is what the model computes " +
+                       eitherOf(itsCompared.otherRuns) + ".\n";
         } else if (const auto shifts = findShifts(itsModel, itsDump.values); !shifts.empty()) {
             itsText += "Found: " + eitherOf(shifts) + ".\n";
             return;
@@ -393,6 +434,16 @@ private:
 std::string textOf(const Compared& compared)
 {
     return Reporter(compared).text();
+}
+
+std::string firstDifferenceOf(const Compared& compared)
+{
+    return Reporter(compared).firstDifference();
+}
+
+std::string headlineOf(const Compared& compared)
+{
+    return Reporter(compared).headline();
 }
 
 }  // namespace morvik::comparison

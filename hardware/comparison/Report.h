@@ -21,10 +21,18 @@ struct Compared {
     std::string name;                    ///< of the dump in messages
     bool isPartial;                      ///< whether the dump may lack values
     std::vector<std::string> otherRuns;  ///< changes with which the model computes exactly this dump
+    const char* values = "the dump";     ///< what the values are called
+    bool countsAlways = false;           ///< whether signals are counted even if nothing differs
 };
 
 /// Formats the report.
 std::string textOf(const Compared& compared);
+
+/// Formats the first difference alone: its place, what its inputs say, and what explains it.
+std::string firstDifferenceOf(const Compared& compared);
+
+/// The same in a line: "alpha0 of half-iteration 2, step 64: expected 920, got 927".
+std::string headlineOf(const Compared& compared);
 
 }  // namespace morvik::comparison
 

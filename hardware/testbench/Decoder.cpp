@@ -2,9 +2,11 @@
 #include "Decoder.h"
 
 #include <iostream>
+#include <mutex>
 #include <sstream>
 #include <string>
 
+#include "base/OutputTurn.h"
 #include "morvik_v1_0_batch.h"
 #include "src/DecoderState.h"
 
@@ -16,7 +18,10 @@ namespace {
 class Redirection {
 public:
     explicit Redirection(std::ostream& messages)
-        : itsMessages(messages), itsOutput(std::cout.rdbuf(messages.rdbuf())), itsError(std::cerr.rdbuf(&itsErrors))
+        : itsTurn(base::outputTurn()),
+          itsMessages(messages),
+          itsOutput(std::cout.rdbuf(messages.rdbuf())),
+          itsError(std::cerr.rdbuf(&itsErrors))
     {
     }
 
@@ -44,6 +49,7 @@ public:
     }
 
 private:
+    std::lock_guard<std::mutex> itsTurn;
     std::ostream& itsMessages;
     std::stringbuf itsErrors;
     std::streambuf* itsOutput;

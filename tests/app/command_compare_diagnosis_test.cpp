@@ -4,6 +4,7 @@
 #include <sstream>
 
 #include "CompareTest.h"
+#include "Lockstep.h"
 
 namespace {
 
@@ -28,6 +29,27 @@ std::ostream& operator<<(std::ostream& out, const FaultCase& each)
 
 class FaultyCore : public Compare, public testing::WithParamInterface<FaultCase> {};
 
+/// What a report says of the first difference: its place and its values, and which operation is at fault.
+std::string firstDifferenceIn(const std::string& text)
+{
+    const std::size_t values = text.find("  half-iteration  ");
+    const std::size_t context = text.find("\n\n      step ", values);
+    const std::size_t verdict = text.find("\n\n", context + 2);
+    return text.substr(values, context - values) + text.substr(verdict, text.find("\n\n", verdict + 2) - verdict);
+}
+
+/// A simulation in lockstep is stopped at the same value, with the same words.
+void expectLockstep(const FaultCase& given, const std::string& dump, const std::string& compared)
+{
+    const Lockstep lockstep =
+        observeInLockstep(dump, noisyBlock(given.K, given.amplitude), given.units, given.algorithm, 4);
+    EXPECT_EQ(lockstep.standing, MORVIK_CHECKER_DIFFERS);
+    ASSERT_EQ(lockstep.messages.size(), 1U);
+    EXPECT_EQ(firstDifferenceIn(lockstep.messages[0]), firstDifferenceIn(compared));
+    EXPECT_EQ(lockstep.messages[0].rfind("ERROR:checker:", 0), 0U) << lockstep.messages[0];
+    EXPECT_TRUE(has(lockstep.report + '\n', given.found)) << lockstep.report;
+}
+
 TEST_P(FaultyCore, IsFoundAtItsPlace)
 {
     const FaultCase& given = GetParam();
@@ -39,6 +61,7 @@ TEST_P(FaultyCore, IsFoundAtItsPlace)
     EXPECT_TRUE(has(result.out, "  half-iteration  " + std::to_string(given.halfIteration) + ", on the")) << result.out;
     EXPECT_TRUE(has(result.out, std::string("At fault: ") + given.operation)) << result.out;
     EXPECT_TRUE(has(result.out, given.found)) << result.out;
+    expectLockstep(given, morvik.read("rtl.csv"), result.out);
     if (std::getenv("MORVIK_SHOW_REPORTS") != nullptr) {
         std::cout << result.out;
     }

@@ -28,6 +28,7 @@ BELOW = {
     "hardware/vectors": "base hardware/tables hardware/testbench link link/channel rules",
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
+    "hardware/checker": "base hardware/comparison hardware/testbench rules",
     "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
     "validation": "link link/channel link/coding link/modulation link/random rules src",
 }

@@ -1,4 +1,5 @@
 /* The public headers alone, as strict C99. */
+#include "morvik_checker.h"
 #include "morvik_link.h"
 #include "morvik_v1_0_version.h"
 

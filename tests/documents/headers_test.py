@@ -12,6 +12,7 @@ import sys
 # What an example takes for granted: a state, and somebody who uses the decisions.
 BEFORE = """#include "{name}"
 #include <stddef.h>
+#include <stdio.h>
 static void use(const unsigned char* bits, unsigned size, unsigned tag) {{ (void)bits; (void)size; (void)tag; }}
 int example({parameters});
 int example({parameters})
@@ -36,7 +37,7 @@ def main():
         sys.exit(__doc__)
     for header in map(pathlib.Path, sys.argv[1:]):
         lines = example_of(header)
-        parameters = "void" if "create_state" in lines or "morvik_link" in header.name else "veltra_ip_morvik_v1_0_state* state"
+        parameters = "void" if "_create" in lines else "veltra_ip_morvik_v1_0_state* state"
         program = BEFORE.format(name=header.name, parameters=parameters) + lines + AFTER
         subprocess.run(["cc", "-std=c99", "-Wall", "-Wextra", "-Werror", "-Wno-unused-variable", "-Wno-unused-but-set-variable",
                         f"-I{header.parent}", "-fsyntax-only", "-x", "c", "-"], input=program, text=True, check=True)

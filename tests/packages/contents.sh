@@ -15,14 +15,15 @@ fail() {
 cd "$folder"
 
 version=$("$build/bin/morvik" --version | sed 's/^morvik //')-1
-library=libmorvik-v1-0-bitacc-cmodel1 link=libmorvik-link1 development=libmorvik-v1-0-bitacc-cmodel-dev
+library=libmorvik-v1-0-bitacc-cmodel1 link=libmorvik-link1 checker=libmorvik-checker1 development=libmorvik-v1-0-bitacc-cmodel-dev
 case $(file -L "$build/bin/morvik") in
     *32-bit*)
         architecture=i386
-        expected=("$library" "$link" "$development" morvik morvik-simulators) ;;
+        expected=("$library" "$link" "$checker" "$development" morvik morvik-simulators) ;;
     *)
         architecture=amd64
-        expected=("$library" "$link" "$development" morvik morvik-mpi morvik-simulators python3-morvik gr-morvik octave-morvik morvik-doc) ;;
+        expected=("$library" "$link" "$checker" "$development" morvik morvik-mpi morvik-simulators python3-morvik gr-morvik octave-morvik
+            morvik-doc) ;;
 esac
 names=()
 for package in *.deb; do
@@ -44,6 +45,7 @@ depends "$library" libstdc++6
 depends "$link" libstdc++6
 depends "$development" "$library"
 depends "$development" "$link"
+depends "$development" "$checker"
 depends morvik "$library"
 [ "$(field "$library" Multi-Arch)$(field "$link" Multi-Arch)" = samesame ] || fail "The libraries of two architectures exclude each other"
 if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) == *lib*32* ]]; then

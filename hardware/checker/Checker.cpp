@@ -1,0 +1,95 @@
+// Checker: compares the values of a simulation with the model while they appear.
+#include "Checker.h"
+
+#include "hardware/comparison/Comparison.h"
+#include "hardware/comparison/Coverage.h"
+#include "hardware/comparison/Dump.h"
+#include "hardware/comparison/NameMap.h"
+#include "hardware/comparison/Report.h"
+#include "hardware/testbench/Decoder.h"
+
+#include <algorithm>
+#include <sstream>
+
+namespace morvik::checker {
+
+Checker::Checker(const veltra_ip_morvik_v1_0_generics& generics) : itsGenerics(generics)
+{
+    std::ostringstream warnings;
+    const Decoder allowed(generics, warnings);
+}
+
+void Checker::start(const SoftBlock& block, unsigned iterations, std::ostream& warnings)
+{
+    forget();
+    itsModel = comparison::computeModel(block, itsGenerics, iterations, warnings);
+    itsSeen.emplace(passes(), steps());
+    ++itsBlocks;
+}
+
+void Checker::forget()
+{
+    itsModel.reset();
+    itsCounts = {};
+    itsDifferences = 0;
+}
+
+Seen Checker::seen(unsigned signal) const
+{
+    return {itsCounts[signal], hasBlock() ? passes() * (itsModel->cut.K() + stepsAfterBits(stageOf(signal))) : 0};
+}
+
+Standing Checker::standing() const
+{
+    if (itsDifferences > 0) {
+        return Standing::differs;
+    }
+    bool isAny = false;
+    for (unsigned signal = 0; signal < signalCount; ++signal) {
+        const Seen each = seen(signal);
+        if (each.seen > 0 && each.seen < each.expected) {
+            return Standing::incomplete;
+        }
+        isAny = isAny || each.seen > 0;
+    }
+    return isAny ? Standing::agrees : Standing::incomplete;
+}
+
+std::string Checker::name() const
+{
+    return "block " + std::to_string(itsBlocks - 1);
+}
+
+template <class Format>
+std::string Checker::formatted(Format format) const
+{
+    comparison::Dump record(passes(), steps());
+    record.values = *itsSeen;
+    for (unsigned signal = 0; signal < signalCount; ++signal) {
+        record.given[signal] = itsCounts[signal] > 0;
+    }
+    comparison::completeTwins(name(), {}, record);
+    const comparison::Comparison found = comparison::compare(*itsModel, record.values);
+    const comparison::Coverage coverage = comparison::coverageOf(*itsModel, record);
+    return format({found, coverage, *itsModel, record, name(), true, {}, "the record", true});
+}
+
+std::string Checker::headline() const
+{
+    return formatted(comparison::headlineOf);
+}
+
+std::string Checker::firstDifference() const
+{
+    return formatted(comparison::firstDifferenceOf);
+}
+
+std::string Checker::report() const
+{
+    if (std::all_of(itsCounts.begin(), itsCounts.end(), [](std::uint32_t count) { return count == 0; })) {
+        return name() + ": nothing has been observed\n";
+    }
+    return formatted(comparison::textOf);
+}
+
+}  // namespace morvik::checker

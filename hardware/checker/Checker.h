@@ -1,0 +1,118 @@
+// Checker: compares the values of a simulation with the model while they appear.
+#ifndef MORVIK_HARDWARE_CHECKER_CHECKER_H
+#define MORVIK_HARDWARE_CHECKER_CHECKER_H
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <ostream>
+#include <string>
+
+#include "hardware/comparison/Model.h"
+#include "hardware/comparison/Values.h"
+#include "hardware/testbench/SoftBlock.h"
+#include "morvik_v1_0_bitacc_cmodel.h"
+
+namespace morvik::checker {
+
+using comparison::Place;
+using comparison::Values;
+
+/// Values of one signal.
+struct Seen {
+    std::uint32_t seen = 0;
+    std::uint32_t expected = 0;  ///< the core computes so many
+};
+
+/// How a block stands.
+enum class Standing : std::uint8_t {
+    agrees,
+    differs,
+    incomplete  ///< nothing is seen, or values of the seen signals are missing
+};
+
+/// One block at a time. Every value that the core computes on it is known from `start` on, so observing a value costs
+/// a look into a table; only the first difference is reasoned about, by what `morvik compare` knows.
+class Checker {
+public:
+    /// Throws Refusal if the generics are not allowed.
+    explicit Checker(const veltra_ip_morvik_v1_0_generics& generics);
+
+    /// Decodes a block, and forgets the one before. The library's warnings go to `warnings`. Throws Refusal, and has no
+    /// block then.
+    void start(const SoftBlock& block, unsigned iterations, std::ostream& warnings);
+
+    /// Ends the block, of which nothing is known any more.
+    void forget();
+
+    bool hasBlock() const
+    {
+        return itsModel.has_value();
+    }
+
+    /// Half-iterations of the block, and its steps, the tail's included: 0 without a block.
+    unsigned passes() const
+    {
+        return hasBlock() ? itsModel->values.passes() : 0;
+    }
+
+    unsigned steps() const
+    {
+        return hasBlock() ? itsModel->values.steps() : 0;
+    }
+
+    /// What the core computes; nothing where it computes none. The place must be one of the block.
+    std::optional<std::int16_t> expected(const Place& place) const
+    {
+        return itsModel->values.has(place) ? std::optional(itsModel->values.at(place)) : std::nullopt;
+    }
+
+    /// Takes a value, or Values::unknown, and tells whether it agrees. The place must be one of the block. Where the
+    /// core computes nothing, everything agrees. Of several values observed at a place, the first wrong one stays.
+    bool observe(const Place& place, std::int16_t value)
+    {
+        const std::int16_t wanted = itsModel->values.at(place);
+        if (wanted == Values::missing) {
+            return true;
+        }
+        const std::int16_t before = itsSeen->at(place);
+        itsCounts[place.signal] += before == Values::missing ? 1U : 0U;
+        if (before == Values::missing || before == wanted) {
+            itsSeen->set(place, value);
+            itsDifferences += value == wanted ? 0U : 1U;
+        }
+        return value == wanted;
+    }
+
+    /// Places with a wrong value.
+    std::uint64_t differences() const
+    {
+        return itsDifferences;
+    }
+
+    Seen seen(unsigned signal) const;
+    Standing standing() const;
+
+    /// The first of the differences in the order of computation, in a line and in full. There must be one.
+    std::string headline() const;
+    std::string firstDifference() const;
+
+    /// What has been compared, what has not, and all differences. There must be a block.
+    std::string report() const;
+
+private:
+    std::string name() const;
+    template <class Format>
+    std::string formatted(Format format) const;
+
+    veltra_ip_morvik_v1_0_generics itsGenerics;
+    std::uint64_t itsBlocks = 0;  ///< started
+    std::optional<comparison::Model> itsModel;
+    std::optional<Values> itsSeen;  ///< of the model's size
+    std::array<std::uint32_t, signalCount> itsCounts = {};
+    std::uint64_t itsDifferences = 0;
+};
+
+}  // namespace morvik::checker
+
+#endif
