@@ -1,10 +1,13 @@
 // morvik_dpi: the C functions that morvik_pkg.sv imports. No exception passes into the simulator.
 #include "morvik_dpi.h"
 
+#include <array>
 #include <cstddef>
+#include <cstdint>
 #include <exception>
 
 #include "bindings/simulator/Session.h"
+#include "morvik_checker.h"
 
 namespace {
 
@@ -78,4 +81,22 @@ unsigned int morvik_dpi_tag(void* decoder)
 const char* morvik_dpi_message(void* decoder)
 {
     return decoder == nullptr ? "" : sessionOf(decoder)->nextMessage().c_str();
+}
+
+int morvik_dpi_observe_row(void* checker,
+                           int signal,
+                           int half_iteration,
+                           int step,
+                           int value0,
+                           int value1,
+                           int value2,
+                           int value3,
+                           int value4,
+                           int value5,
+                           int value6,
+                           int value7)
+{
+    const std::array<std::int32_t, 8> values = {value0, value1, value2, value3, value4, value5, value6, value7};
+    return morvik_checker_observe_row(
+        static_cast<morvik_checker*>(checker), signal, half_iteration, step, values.data());
 }

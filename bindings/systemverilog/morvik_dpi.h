@@ -1,5 +1,6 @@
-/* The C functions that morvik_pkg.sv imports. They need nothing of a simulator: scalars, handles and texts are the same
- * in C for every one, and no arrays are passed, on which they disagree.
+/* The C functions that morvik_pkg.sv imports, besides those of morvik_checker.h, which the library has as well. They
+ * need nothing of a simulator: scalars, handles and texts are the same in C for every one, and no arrays are passed, on
+ * which they disagree.
  *
  * A decoder is null after a failure to allocate it alone; generics that are refused leave one that is not open, whose
  * message tells why. Every function takes a null decoder, and does nothing with it.
@@ -33,6 +34,20 @@ MORVIK_API unsigned int morvik_dpi_tag(void* decoder);
 
 /* Takes the oldest message, a line that begins with "ERROR:" or "WARNING:", or "" when there is none. */
 MORVIK_API const char* morvik_dpi_message(void* decoder);
+
+/* morvik_checker_observe_row with scalars: the last four values of a row of four do not matter. */
+MORVIK_API int morvik_dpi_observe_row(void* checker,
+                                      int signal,
+                                      int half_iteration,
+                                      int step,
+                                      int value0,
+                                      int value1,
+                                      int value2,
+                                      int value3,
+                                      int value4,
+                                      int value5,
+                                      int value6,
+                                      int value7);
 
 #ifdef __cplusplus
 }

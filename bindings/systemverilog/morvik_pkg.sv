@@ -17,12 +17,50 @@ package morvik_pkg;
     import "DPI-C" function int unsigned morvik_dpi_tag(input chandle decoder);
     import "DPI-C" function string morvik_dpi_message(input chandle decoder);
 
+    import "DPI-C" function chandle morvik_checker_create(input int num_pu, input int algorithm);
+    import "DPI-C" function void morvik_checker_destroy(input chandle handle);
+    import "DPI-C" function int morvik_checker_is_open(input chandle handle);
+    import "DPI-C" function void morvik_checker_put(
+        input chandle handle, input int sys, input int par1, input int par2);
+    import "DPI-C" function int morvik_checker_start(input chandle handle, input int iterations);
+    import "DPI-C" function int morvik_checker_signal(input string name);
+    import "DPI-C" function int morvik_checker_observe(
+        input chandle handle, input int signal, input int half_iteration, input int step, input int value);
+    import "DPI-C" function int morvik_dpi_observe_row(
+        input chandle handle, input int signal, input int half_iteration, input int step,
+        input int value0, input int value1, input int value2, input int value3,
+        input int value4, input int value5, input int value6, input int value7);
+    import "DPI-C" function int morvik_checker_value(
+        input chandle handle, input int signal, input int half_iteration, input int step);
+    import "DPI-C" function int morvik_checker_ratio(input chandle handle, input int bit_number);
+    import "DPI-C" function int morvik_checker_seen(input chandle handle, input int signal);
+    import "DPI-C" function int morvik_checker_expected(input chandle handle, input int signal);
+    import "DPI-C" function int morvik_checker_standing(input chandle handle);
+    import "DPI-C" function string morvik_checker_report(input chandle handle);
+    import "DPI-C" function string morvik_checker_message(input chandle handle);
+
     localparam int ALGORITHM_MAX_LOG = 0;
     localparam int ALGORITHM_SCALED = 1;  // max-log, extrinsic values times 0.75
     localparam int ALGORITHM_TABLE = 2;   // max-log with a correction table
 
+    // Signals: SIGNAL_ALPHA + 3 is alpha3.
+    localparam int SIGNAL_INTRINSIC = 0;
+    localparam int SIGNAL_G = 1;       // branch metrics g0 to g3
+    localparam int SIGNAL_ALPHA = 5;   // forward metrics alpha0 to alpha7
+    localparam int SIGNAL_BETA = 13;   // backward metrics beta0 to beta7
+    localparam int SIGNAL_LLR = 21;    // log-likelihood ratio
+    localparam int SIGNAL_EXTRINSIC = 22;
+
+    // What a checker answers.
+    localparam int CHECKER_AGREES = 0;
+    localparam int CHECKER_DIFFERS = 1;
+    localparam int CHECKER_REFUSED = 2;
+    localparam int CHECKER_INCOMPLETE = 3;
+    localparam int VALUE_UNKNOWN = 32'sh8000_0000;  // x, or no value
+
     typedef int soft_values_t[];  // K + 4 values of a stream, -128 to 127; positive ones favour bit 1
     typedef bit decisions_t[];
+    typedef logic signed [31:0] metrics_t[8];  // a row; the last four of g are not used
 
     // How error and warning lines reach the log. A derived class can hand them to uvm_error and uvm_warning instead; an
     // object of it in morvik_log serves all decoders.
@@ -38,11 +76,34 @@ package morvik_pkg;
 
     morvik_reporter morvik_log;
 
+    // What the model says goes to the log, and stays to be read.
+    class morvik_speaker;
+        string message;  // of the last call: all that the model said, separated by line feeds
+
+        protected function void add_message(string line);
+            if (morvik_log == null)
+                morvik_log = new;
+            message = message == "" ? line : {message, "\n", line};
+            if (line.len() >= 8 && line.substr(0, 7) == "WARNING:")
+                morvik_log.report_warning(line);
+            else
+                morvik_log.report_error(line);
+        endfunction
+
+        // Whether the three streams of a block have one length; otherwise says so.
+        protected function bit are_alike(int sys, int par1, int par2);
+            if (sys == par1 && sys == par2)
+                return 1;
+            add_message($sformatf("ERROR:binding:The streams differ in length: sys has %0d values, par1 %0d, par2 %0d",
+                sys, par1, par2));
+            return 0;
+        endfunction
+    endclass
+
     // A decoder. Call destroy when done with it: its memory is outside the simulator's.
-    class morvik_decoder;
+    class morvik_decoder extends morvik_speaker;
         // Results of the last call.
         int status;             // 0 decoded, 1 an argument was refused, 2 the block was refused, 99 out of memory
-        string message;         // all lines that the model wrote, separated by line feeds
         decisions_t dout;       // K decisions; none if the block was refused
         int unsigned dout_tag;  // the tag, truncated to tag_width bits
 
@@ -79,11 +140,7 @@ package morvik_pkg;
                 add_message("ERROR:binding:decode was called after destroy");
             else if (handle == null)
                 add_message("ERROR:binding:decode was called without a decoder");
-            else if (sys.size() != par1.size() || sys.size() != par2.size())
-                add_message($sformatf(
-                    "ERROR:binding:The streams differ in length: sys has %0d values, par1 %0d, par2 %0d",
-                    sys.size(), par1.size(), par2.size()));
-            else
+            else if (are_alike(sys.size(), par1.size(), par2.size()))
                 result = decode_streams(sys, par1, par2, iterations, tag);
             status = result;
             return result;
@@ -135,15 +192,121 @@ package morvik_pkg;
                 line = morvik_dpi_message(handle);
             end
         endfunction
+    endclass
 
-        local function void add_message(string line);
-            if (morvik_log == null)
-                morvik_log = new;
-            message = message == "" ? line : {message, "\n", line};
-            if (line.len() >= 8 && line.substr(0, 7) == "WARNING:")
-                morvik_log.report_warning(line);
-            else
-                morvik_log.report_error(line);
+    // A checker: compares the values of a core with the model while the simulation runs. docs/checker.md explains it. Call
+    // destroy when done with it.
+    class morvik_checker extends morvik_speaker;
+        local chandle handle;
+
+        // num_pu 2, 4 or 8; algorithm 0 to 2. Other values are reported, and is_open tells.
+        function new(int num_pu = 2, int algorithm = ALGORITHM_SCALED);
+            handle = morvik_checker_create(num_pu, algorithm);
+            void'(answered(1 - morvik_checker_is_open(handle)));
+        endfunction
+
+        // Whether the configuration was accepted, and destroy was not called.
+        function bit is_open();
+            return morvik_checker_is_open(handle) != 0;
+        endfunction
+
+        // Begins a block: K + 4 soft values of each stream. What was observed before is forgotten. Returns CHECKER_AGREES,
+        // or another number after an error.
+        function int start(
+            input soft_values_t sys,
+            input soft_values_t par1,
+            input soft_values_t par2,
+            input int iterations = 8
+        );
+            int result;
+            message = "";
+            if (!are_alike(sys.size(), par1.size(), par2.size()))
+                return CHECKER_REFUSED;
+            for (int i = 0; i < sys.size(); i++)
+                morvik_checker_put(handle, sys[i], par1[i], par2[i]);
+            result = morvik_checker_start(handle, iterations);
+            void'(answered(1));  // there may be warnings
+            return result;
+        endfunction
+
+        // Takes a value of the core, in eighths: a register's bits, sign-extended. The first difference of a block is an
+        // error. Returns CHECKER_AGREES, CHECKER_DIFFERS or CHECKER_REFUSED.
+        function int observe(int signal, int half_iteration, int step, logic signed [31:0] got);
+            return answered(morvik_checker_observe(handle, signal, half_iteration, step, known(got)));
+        endfunction
+
+        // The same for all values of SIGNAL_G, SIGNAL_ALPHA or SIGNAL_BETA.
+        function int observe_row(int signal, int half_iteration, int step, metrics_t got);
+            return answered(morvik_dpi_observe_row(handle, signal, half_iteration, step,
+                known(got[0]), known(got[1]), known(got[2]), known(got[3]),
+                known(got[4]), known(got[5]), known(got[6]), known(got[7])));
+        endfunction
+
+        // What the core computes, or VALUE_UNKNOWN where it computes nothing.
+        function int value(int signal, int half_iteration, int step);
+            int result;
+            result = morvik_checker_value(handle, signal, half_iteration, step);
+            void'(answered(result == VALUE_UNKNOWN ? 1 : 0));
+            return result;
+        endfunction
+
+        // The log-likelihood ratio of a bit after the last half-iteration, in eighths.
+        function int ratio(int bit_number);
+            int result;
+            result = morvik_checker_ratio(handle, bit_number);
+            void'(answered(result == VALUE_UNKNOWN ? 1 : 0));
+            return result;
+        endfunction
+
+        // Values of a signal observed so far, and values that the core computes.
+        function int seen(int signal);
+            return morvik_checker_seen(handle, signal);
+        endfunction
+
+        function int expected(int signal);
+            return morvik_checker_expected(handle, signal);
+        endfunction
+
+        // Prints how much of the block was observed, and all differences. Returns CHECKER_AGREES, CHECKER_DIFFERS, or
+        // CHECKER_INCOMPLETE after an error if values are missing. With `partial`, they may be.
+        function int report(bit partial = 0);
+            int standing;
+            standing = morvik_checker_standing(handle);
+            $display("%s", morvik_checker_report(handle));
+            if (standing == CHECKER_INCOMPLETE && partial)
+                standing = CHECKER_AGREES;
+            void'(answered(standing));
+            if (standing == CHECKER_INCOMPLETE)
+                add_message("ERROR:checker:Values are missing");
+            return standing;
+        endfunction
+
+        // Releases the checker. Another call does nothing.
+        function void destroy();
+            morvik_checker_destroy(handle);
+            handle = null;
+        endfunction
+
+        local function int known(logic signed [31:0] got);
+            return $isunknown(got) ? VALUE_UNKNOWN : got;
+        endfunction
+
+        // Passes the messages on if there may be some.
+        local function int answered(int answer);
+            string line;
+            message = "";
+            if (answer == 0)
+                return answer;
+            if (handle == null) begin
+                add_message("ERROR:binding:There is no checker: it was destroyed, or there is no memory for it");
+                return answer;
+            end
+            line = morvik_checker_message(handle);
+            while (line != "") begin
+                add_message(line);
+                line = morvik_checker_message(handle);
+            end
+            return answer;
         endfunction
     endclass
 

@@ -1,5 +1,5 @@
 // core: decodes a block and writes what hardware like this model would, as a dump: CSV with a row for each value of
-// each pass; hardware without a fault, or with one that has a name.
+// each pass; hardware without a fault, or with one that has a name. Or as a replay, for test benches: see writeReplay.
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -84,6 +84,30 @@ void write(const Values& values)
     }
 }
 
+/// Numbers between white space: units, algorithm, iterations and positions; the block; then, in the order of
+/// computation, what each operation gives: signal, half-iteration, step, and eight values, the last of which are 0
+/// where there are fewer.
+void writeReplay(const morvik::SoftBlock& block, const Model& model)
+{
+    std::cout << model.generics.C_NUM_PU << ' ' << model.generics.C_ALGORITHM_TYPE << ' ' << model.values.passes() / 2
+              << ' ' << block.size() << '\n';
+    for (std::size_t i = 0; i < block.size(); ++i) {
+        std::cout << block.rsc1Sys[i] << ' ' << block.rsc1Par[i] << ' ' << block.rsc2Par[i] << '\n';
+    }
+    for (unsigned pass = 0; pass < model.values.passes(); ++pass) {
+        for (const morvik::Stage stage : morvik::stages) {
+            const auto [first, count] = morvik::signalsOf(stage);
+            for (const unsigned step : stepsInOrder(model.cut, stage)) {
+                std::cout << first << ' ' << pass << ' ' << step;
+                for (unsigned i = 0; i < 8; ++i) {
+                    std::cout << ' ' << (i < count ? model.values.at({pass, first + i, step}) : 0);
+                }
+                std::cout << '\n';
+            }
+        }
+    }
+}
+
 }  // namespace
 
 // The linker puts the second function in the place of the library's, which becomes the first. The names are its own.
@@ -101,10 +125,12 @@ veltra_ip_morvik_v1_0_state* __wrap_veltra_ip_morvik_v1_0_create_state(veltra_ip
 }
 // NOLINTEND(bugprone-reserved-identifier)
 
-/// Arguments: the fault or "none", units, algorithm type, iterations. The block comes from standard input.
+/// Arguments: the fault or "none", units, algorithm type, iterations, and perhaps "replay". The block comes from
+/// standard input.
 int main(int argc, char** argv)
 {
-    if (argc != 5) {
+    const bool isReplay = argc == 6 && std::string(argv[5]) == "replay";
+    if (argc != 5 && !isReplay) {
         return 2;
     }
     const std::string name = argv[1];
@@ -117,6 +143,12 @@ int main(int argc, char** argv)
     veltra_ip_morvik_v1_0_generics generics = veltra_ip_morvik_v1_0_get_default_generics();
     generics.C_NUM_PU = std::atoi(argv[2]);
     generics.C_ALGORITHM_TYPE = std::atoi(argv[3]);
-    write(computeModel(readBlock(std::cin), generics, static_cast<unsigned>(std::atoi(argv[4])), std::cerr).values);
+    const morvik::SoftBlock block = readBlock(std::cin);
+    const Model model = computeModel(block, generics, static_cast<unsigned>(std::atoi(argv[4])), std::cerr);
+    if (isReplay) {
+        writeReplay(block, model);
+    } else {
+        write(model.values);
+    }
     return 0;
 }

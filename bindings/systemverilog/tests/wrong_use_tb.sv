@@ -95,6 +95,54 @@ module wrong_use_tb;
         model.destroy();
     endfunction
 
+    function automatic void expect_answer(morvik_checker check, int got, int answer, string message);
+        if (got == answer && check.message == message)
+            return;
+        failures++;
+        $display("expected answer %0d and '%s'", answer, message);
+        $display("got      answer %0d and '%s'", got, check.message);
+    endfunction
+
+    function automatic void refuse_checks();
+        morvik_checker check, other;
+        metrics_t row;
+        string no_block;
+        no_block = "ERROR:checker:There is no block: start comes before values are observed or asked for";
+        check = new(3);
+        expect_answer(check, int'(check.is_open()), 0, "ERROR:decoder:C_NUM_PU must be either 2, 4 or 8");
+        check.destroy();
+        check = new;
+        expect_answer(check, check.observe(SIGNAL_LLR, 0, 0, 0), CHECKER_REFUSED, no_block);
+        expect_answer(check, check.ratio(0), VALUE_UNKNOWN, no_block);
+        expect_answer(check, check.start(values(44), values(44), values(43), 8), CHECKER_REFUSED,
+            "ERROR:binding:The streams differ in length: sys has 44 values, par1 44, par2 43");
+        expect_answer(check, check.start(values(40), values(40), values(40), 8), CHECKER_REFUSED,
+            {"ERROR:checker:Block size not supported: 40 soft values in each stream, but a block of 40 bits has 44, ",
+            "the tail included"});
+        expect_answer(check, check.start(values(44), values(44), values(44), 8), CHECKER_AGREES, "");
+        expect_answer(check, check.observe(SIGNAL_LLR, 16, 0, 0), CHECKER_REFUSED,
+            "ERROR:checker:Half-iteration 16 is not allowed, expected 0 to 15");
+        expect_answer(check, check.observe(SIGNAL_ALPHA, 0, 0, 'hf00), CHECKER_REFUSED,
+            {"ERROR:checker:alpha0 3840 is not allowed, expected -2048 to 2047: eighths, a register's bits in two's ",
+            "complement, sign-extended"});
+        for (int i = 0; i < 8; i++)
+            row[i] = check.value(SIGNAL_BETA + i, 3, 5);
+        expect_answer(check, check.observe_row(SIGNAL_BETA + 1, 3, 5, row), CHECKER_REFUSED,
+            "ERROR:checker:beta1 is not the first of its row, beta0");
+        expect_answer(check, check.observe_row(SIGNAL_BETA, 3, 5, row), CHECKER_AGREES, "");
+        expect_answer(check, check.report(1), CHECKER_AGREES, "");
+        expect_answer(check, check.report(), CHECKER_INCOMPLETE, "ERROR:checker:Values are missing");
+        other = new(8);
+        expect_answer(other, other.start(values(44), values(44), values(44), 1), CHECKER_AGREES, "");
+        expect_answer(other, other.seen(SIGNAL_BETA), 0, "");
+        expect_answer(check, check.seen(SIGNAL_BETA), 1, "ERROR:checker:Values are missing");
+        other.destroy();
+        check.destroy();
+        expect_answer(check, check.observe(SIGNAL_LLR, 0, 0, 0), CHECKER_REFUSED,
+            "ERROR:binding:There is no checker: it was destroyed, or there is no memory for it");
+        check.destroy();
+    endfunction
+
     // The class unchanged.
     function automatic void report();
         morvik_decoder model;
@@ -126,6 +174,7 @@ module wrong_use_tb;
             morvik_log = reporter;
             refuse_generics();
             refuse_blocks();
+            refuse_checks();
             warn();
             call_with_null();
         end
