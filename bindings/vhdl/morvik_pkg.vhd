@@ -50,6 +50,12 @@ package morvik_pkg is
     -- Releases a decoder. An unknown number is ignored.
     procedure morvik_destroy (decoder : in integer);
 
+    -- The text that the library gave last, of the length that it told.
+    impure function morvik_taken (length : natural) return string;
+
+    -- Reports a line of the library: "WARNING:..." with severity warning, any other with severity error.
+    procedure morvik_report_line (line : in string);
+
     -- The functions of the C library, on which the ones above are built.
     impure function morvik_vhdl_create (num_pu, algorithm, tag_width : integer) return integer;
     procedure morvik_vhdl_destroy (decoder : in integer);
@@ -81,32 +87,32 @@ package body morvik_pkg is
         return text'length >= start'length and first(1 to start'length) = start;
     end function starts_with;
 
-    procedure report_line (line : in string) is
+    impure function morvik_taken (length : natural) return string is
+        variable text : string(1 to length);
+    begin
+        for i in text'range loop
+            text(i) := character'val(morvik_vhdl_character(i));
+        end loop;
+        return text;
+    end function morvik_taken;
+
+    procedure morvik_report_line (line : in string) is
     begin
         if starts_with(line, "WARNING:") then
             report "morvik: " & line severity warning;
         else
             report "morvik: " & line severity error;
         end if;
-    end procedure report_line;
+    end procedure morvik_report_line;
 
     -- Reports the library's messages about a decoder.
     procedure report_messages (decoder : in integer) is
         variable length : natural;
-
-        procedure report_message is
-            variable line : string(1 to length);
-        begin
-            for i in line'range loop
-                line(i) := character'val(morvik_vhdl_character(i));
-            end loop;
-            report_line(line);
-        end procedure report_message;
     begin
         loop
             length := morvik_vhdl_message(decoder);
             exit when length = 0;
-            report_message;
+            morvik_report_line(morvik_taken(length));
         end loop;
     end procedure report_messages;
 
@@ -118,7 +124,7 @@ package body morvik_pkg is
         variable decoder : integer := morvik_vhdl_create(num_pu, algorithm, tag_width);
     begin
         if decoder = 0 then
-            report_line("ERROR:binding:No memory for a decoder");
+            morvik_report_line("ERROR:binding:No memory for a decoder");
             return 0;
         end if;
         report_messages(decoder);
@@ -147,13 +153,13 @@ package body morvik_pkg is
     begin
         result := morvik_argument_refused;
         if morvik_vhdl_is_open(decoder) = 0 then
-            report_line("ERROR:binding:" & integer'image(decoder) &
+            morvik_report_line("ERROR:binding:" & integer'image(decoder) &
                 " is no decoder: it was not created, or has been destroyed");
         elsif sys'length /= par1'length or sys'length /= par2'length then
-            report_line("ERROR:binding:The streams differ in length: sys has " & integer'image(sys'length) &
+            morvik_report_line("ERROR:binding:The streams differ in length: sys has " & integer'image(sys'length) &
                 " values, par1 " & integer'image(par1'length) & ", par2 " & integer'image(par2'length));
         elsif sys'length >= 4 and bits'length /= sys'length - 4 then
-            report_line("ERROR:binding:Streams of " & integer'image(sys'length) & " values, the tail included, have " &
+            morvik_report_line("ERROR:binding:Streams of " & integer'image(sys'length) & " values, the tail included, have " &
                 integer'image(sys'length - 4) & " decisions, but bits has room for " & integer'image(bits'length));
         else
             for i in sys_of'range loop

@@ -1,14 +1,18 @@
-// morvik_vhdl: the C functions that morvik_pkg.vhd declares as foreign.
+// morvik_vhdl: the C functions that morvik_pkg.vhd and morvik_checker_pkg.vhd declare as foreign.
 //
-// All simulators pass 32-bit integers alike, so a decoder is a number, and a message is read character by character.
-// Every function ignores an unknown number. No exception passes into the simulator. A simulation runs in one thread.
+// All simulators pass 32-bit integers alike, so a decoder or checker is a number, and a message is read character by
+// character. Every function ignores an unknown number. No exception passes into the simulator. A simulation runs in one
+// thread.
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <exception>
 #include <map>
+#include <memory>
 #include <string>
 
 #include "bindings/simulator/Session.h"
+#include "morvik_checker.h"
 
 namespace {
 
@@ -25,6 +29,29 @@ Session* find(std::int32_t decoder)
 {
     const auto found = sessions().find(decoder);
     return found == sessions().end() ? nullptr : &found->second;
+}
+
+struct DestroyChecker {
+    void operator()(morvik_checker* checker) const
+    {
+        morvik_checker_destroy(checker);
+    }
+};
+
+using Checkers = std::map<std::int32_t, std::unique_ptr<morvik_checker, DestroyChecker>>;
+
+/// Checkers by number, likewise.
+Checkers& checkers()
+{
+    static Checkers all;
+    return all;
+}
+
+/// Null for an unknown number, which the functions of morvik_checker.h take.
+morvik_checker* findChecker(std::int32_t checker)
+{
+    const auto found = checkers().find(checker);
+    return found == checkers().end() ? nullptr : found->second.get();
 }
 
 /// The last message taken.
@@ -116,6 +143,102 @@ MORVIK_API std::int32_t morvik_vhdl_character(std::int32_t position)
 {
     const auto index = static_cast<std::size_t>(position) - 1;
     return index < taken().size() ? static_cast<unsigned char>(taken()[index]) : 0;
+}
+
+/// Keeps a text, whose characters are then read, and returns its length.
+static std::int32_t take(const char* text)
+{
+    taken() = text;
+    return static_cast<std::int32_t>(taken().size());
+}
+
+/// A number from 1 that no other checker has had, or 0 if memory is exhausted.
+MORVIK_API std::int32_t morvik_vhdl_checker_create(std::int32_t numPu, std::int32_t algorithm)
+{
+    static std::int32_t last = 0;
+    try {
+        Checkers::mapped_type checker(morvik_checker_create(numPu, algorithm));
+        if (!checker) {
+            return 0;
+        }
+        checkers()[last + 1] = std::move(checker);
+        return ++last;
+    } catch (const std::exception&) {
+        return 0;
+    }
+}
+
+MORVIK_API void morvik_vhdl_checker_destroy(std::int32_t checker)
+{
+    checkers().erase(checker);
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_is_open(std::int32_t checker)
+{
+    return morvik_checker_is_open(findChecker(checker));
+}
+
+MORVIK_API void morvik_vhdl_checker_put(std::int32_t checker, std::int32_t sys, std::int32_t par1, std::int32_t par2)
+{
+    morvik_checker_put(findChecker(checker), sys, par1, par2);
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_start(std::int32_t checker, std::int32_t iterations)
+{
+    return morvik_checker_start(findChecker(checker), iterations);
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_observe(
+    std::int32_t checker, std::int32_t signal, std::int32_t halfIteration, std::int32_t step, std::int32_t value)
+{
+    return morvik_checker_observe(findChecker(checker), signal, halfIteration, step, value);
+}
+
+/// The last four values of a row of four do not matter.
+MORVIK_API std::int32_t morvik_vhdl_checker_observe_row(std::int32_t checker,
+                                                        std::int32_t signal,
+                                                        std::int32_t halfIteration,
+                                                        std::int32_t step,
+                                                        std::int32_t value0,
+                                                        std::int32_t value1,
+                                                        std::int32_t value2,
+                                                        std::int32_t value3,
+                                                        std::int32_t value4,
+                                                        std::int32_t value5,
+                                                        std::int32_t value6,
+                                                        std::int32_t value7)
+{
+    const std::array<std::int32_t, 8> values = {value0, value1, value2, value3, value4, value5, value6, value7};
+    return morvik_checker_observe_row(findChecker(checker), signal, halfIteration, step, values.data());
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_value(std::int32_t checker,
+                                                  std::int32_t signal,
+                                                  std::int32_t halfIteration,
+                                                  std::int32_t step)
+{
+    return morvik_checker_value(findChecker(checker), signal, halfIteration, step);
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_ratio(std::int32_t checker, std::int32_t bit)
+{
+    return morvik_checker_ratio(findChecker(checker), bit);
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_standing(std::int32_t checker)
+{
+    return morvik_checker_standing(findChecker(checker));
+}
+
+/// Takes the report, or the oldest message, as morvik_vhdl_message does.
+MORVIK_API std::int32_t morvik_vhdl_checker_report(std::int32_t checker)
+{
+    return take(morvik_checker_report(findChecker(checker)));
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_message(std::int32_t checker)
+{
+    return take(morvik_checker_message(findChecker(checker)));
 }
 
 }  // extern "C"
