@@ -82,8 +82,7 @@ void ModulatedSource::receive(std::uint64_t frame, unsigned i, std::size_t place
     for (unsigned s = 0; s < 3; ++s) {
         const float* const ratios = &itsRatios[s * positions];
         std::int8_t* const values = &frames.streams[s][place * positions];
-        softValues(ratios, positions, itsScale, values);
-        frames.clipped[place] += clippedIn(ratios, positions, itsScale);
+        frames.clipped[place] += softValues(ratios, positions, itsScale, values);
     }
 }
 

@@ -4,7 +4,6 @@
 #include <algorithm>
 
 #include "link/coding/PackedBits.h"
-#include "link/kernels/RowKernels.h"
 #include "link/modulation/Mapper.h"
 
 namespace morvik::link {
@@ -20,11 +19,6 @@ std::uint64_t keyWordOf(const SymbolFormat& format)
 {
     const auto kind = static_cast<std::uint64_t>(format.modulation) << 8 | static_cast<std::uint64_t>(format.fading);
     return kind << 32 | static_cast<std::uint32_t>(format.milliDecibels);
-}
-
-std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale)
-{
-    return rowKernels().countOutside(ratios, count, scale, -128.5F, 127.5F);
 }
 
 SymbolLink::SymbolLink(const SymbolFormat& format, const RandomKey& key, const SamplerForm& form)

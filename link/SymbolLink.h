@@ -23,9 +23,6 @@ struct SymbolFormat {
 /// What tells the random numbers of points with different formats apart. The receiver's choices do not.
 std::uint64_t keyWordOf(const SymbolFormat& format);
 
-/// How many soft values were clipped: those of ratios that, times scale, lie outside their range.
-std::uint32_t clippedIn(const float* ratios, std::size_t count, float scale);
-
 class SymbolLink {
 public:
     /// Throws std::invalid_argument for an Es/N0 that FadingChannel refuses.

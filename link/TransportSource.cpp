@@ -56,8 +56,10 @@ TransportSource::TransportSource(const TransportSetting& setting, std::uint64_t 
       itsKey(pointKey(setting, seed)),
       itsRandomBits(itsKey, form),
       itsLink(setting.symbols, itsKey, form),
+      itsAddsNothing(setting.versions.size() == 1 && setting.softBufferBits == 0 && itsCode.sendsOnce()),
       itsRatios(setting.codedBits),
       itsSteps(setting.softBufferBits == 0 ? 0 : setting.codedBits),
+      itsReceived(itsAddsNothing ? setting.codedBits : 0),
       itsValues(itsCode.softSize())
 {
     itsInformation.words = wordsOf(setting.bits);
@@ -71,8 +73,8 @@ void TransportSource::begin(std::uint64_t first, unsigned count)
         drawBits(itsRandomBits, FrameRandom(itsKey, 0, first + i), itsSetting.bits, itsInformation.block(i));
     }
     itsCode.encode(itsInformation, count, itsBuffers);
-    // One buffer serves all frames where nothing is sent again.
-    const std::size_t buffers = itsSetting.versions.size() > 1 ? count : 1;
+    // One buffer serves all frames where nothing is sent again, and none is needed where nothing adds up.
+    const std::size_t buffers = itsAddsNothing ? 0 : itsSetting.versions.size() > 1 ? count : 1;
     itsSoftBuffers.resize(itsSetting.softBufferBits == 0 ? buffers * itsCode.softSize() : 0);
     itsStepBuffers.resize(itsSetting.softBufferBits == 0 ? 0 : buffers * itsCode.softSize());
 }
@@ -85,8 +87,9 @@ void TransportSource::transmit(const std::vector<unsigned>& frames,
     layOut(frames, batches);
     std::array<std::size_t, 2> next{};
     for (const unsigned frame : frames) {
-        clipped[frame] +=
-            itsSetting.softBufferBits == 0 ? recover(frame, transmission) : recoverSteps(frame, transmission);
+        clipped[frame] += itsAddsNothing                   ? place(frame)
+                          : itsSetting.softBufferBits == 0 ? recover(frame, transmission)
+                                                           : recoverSteps(frame, transmission);
         for (unsigned r = 0; r < itsCode.blocks().count; ++r) {
             const unsigned kind = r < itsCode.blocks().countMinus ? 0 : 1;
             CodeBlockBatch& batch = batches.at(kind);
@@ -118,6 +121,16 @@ Value* TransportSource::bufferOf(std::vector<Value>& buffers, unsigned frame, un
     return buffer;
 }
 
+/// Rounds the only transmission of a frame. Returns the number of clipped values.
+std::uint32_t TransportSource::place(unsigned frame)
+{
+    receive(frame, 0);
+    const std::uint32_t clipped =
+        softValues(itsRatios.data(), itsRatios.size(), static_cast<float>(itsSetting.scales[0]), itsReceived.data());
+    itsCode.place(itsReceived.data(), itsSetting.versions[0], itsValues.data());
+    return clipped;
+}
+
 /// Adds a transmission to the soft buffer of a frame and rounds what it holds. Returns the number of clipped values.
 std::uint32_t TransportSource::recover(unsigned frame, unsigned transmission)
 {
@@ -125,8 +138,7 @@ std::uint32_t TransportSource::recover(unsigned frame, unsigned transmission)
     float* const buffer = bufferOf(itsSoftBuffers, frame, transmission);
     itsCode.recover(itsRatios.data(), itsSetting.versions[transmission], buffer);
     const auto scale = static_cast<float>(itsSetting.scales[transmission]);
-    softValues(buffer, itsCode.softSize(), scale, itsValues.data());
-    return clippedIn(buffer, itsCode.softSize(), scale);
+    return softValues(buffer, itsCode.softSize(), scale, itsValues.data());
 }
 
 /// The same with a soft buffer of few bits. What it holds at an end of its range counts as clipped.

@@ -75,6 +75,7 @@ private:
     template <class Value>
     Value* bufferOf(std::vector<Value>& buffers, unsigned frame, unsigned transmission) const;
     void receive(unsigned frame, unsigned transmission);
+    std::uint32_t place(unsigned frame);
     std::uint32_t recover(unsigned frame, unsigned transmission);
     std::uint32_t recoverSteps(unsigned frame, unsigned transmission);
     void layOut(const std::vector<unsigned>& frames, std::array<CodeBlockBatch, 2>& batches) const;
@@ -84,6 +85,7 @@ private:
     RandomKey itsKey;
     RandomBatch itsRandomBits;
     SymbolLink itsLink;
+    bool itsAddsNothing;  ///< no bit is sent twice, and values are not rounded to another width
 
     std::uint64_t itsFirst = 0;
     PackedBlocks itsInformation;
@@ -91,8 +93,9 @@ private:
     std::vector<std::uint64_t> itsCoded;
     std::vector<float> itsRatios;
     std::vector<std::int16_t> itsSteps;
-    std::vector<float> itsSoftBuffers;         ///< if values are added up as floats
-    std::vector<std::int16_t> itsStepBuffers;  ///< otherwise
+    std::vector<float> itsSoftBuffers;         ///< if values are added up as floats,
+    std::vector<std::int16_t> itsStepBuffers;  ///< or in steps
+    std::vector<std::int8_t> itsReceived;      ///< if nothing is added up
     std::vector<std::int8_t> itsValues;
 };
 

@@ -7,6 +7,7 @@
 #include <string>
 
 #include "Decibels.h"
+#include "link/kernels/RowKernels.h"
 
 namespace morvik::link {
 
@@ -22,13 +23,9 @@ int checked(int milliDecibels)
     return milliDecibels;
 }
 
-/// The amplitude of a complex Gaussian number of mean energy 1. The sum of the squares fits in 31 bits.
-float amplitude(std::int32_t real, std::int32_t imaginary)
-{
-    static_assert(std::int64_t{2} * mostNoise * mostNoise <= INT32_MAX);
-    constexpr auto unit = static_cast<float>(1 / (2 * noiseSteps * noiseSteps));
-    return std::sqrt(static_cast<float>(real * real + imaginary * imaginary) * unit);
-}
+/// What makes the square of a complex Gaussian number one of mean energy 1. The sum of the squares fits in 31 bits.
+constexpr auto energyUnit = static_cast<float>(1 / (2 * noiseSteps * noiseSteps));
+static_assert(std::int64_t{2} * mostNoise * mostNoise <= INT32_MAX);
 
 }  // namespace
 
@@ -60,11 +57,7 @@ void FadingChannel::pass(
 {
     if (hasGains()) {
         drawGains(FrameRandom(itsKey, 2 * transmission + 1, frame), first, count, gains);
-        for (std::size_t i = 0; i < count; ++i) {
-            for (unsigned d = 0; d < itsDimensions; ++d) {
-                symbols[i * itsDimensions + d] *= gains[i];
-            }
-        }
+        rowKernels().fade(gains, count, itsDimensions, symbols);
     }
     itsSampler.add(FrameRandom(itsKey, 2 * transmission, frame),
                    itsDimensions * first,
@@ -75,17 +68,17 @@ void FadingChannel::pass(
 
 void FadingChannel::drawGains(const FrameRandom& random, std::uint32_t first, std::uint32_t count, float* gains)
 {
+    const RowKernels& kernels = rowKernels();
     if (itsFading == Fading::constant) {
         std::array<std::int16_t, 2> numbers;
         itsSampler.draw(random, 0, 2, numbers.data());
-        std::fill_n(gains, count, amplitude(numbers[0], numbers[1]));
+        kernels.amplitudes(numbers.data(), 1, energyUnit, gains);
+        std::fill_n(gains, count, gains[0]);
         return;
     }
     itsNumbers.resize(std::max(itsNumbers.size(), std::size_t{2} * count));
     itsSampler.draw(random, 2 * first, 2 * count, itsNumbers.data());
-    for (std::size_t i = 0; i < count; ++i) {
-        gains[i] = amplitude(itsNumbers[2 * i], itsNumbers[2 * i + 1]);
-    }
+    kernels.amplitudes(itsNumbers.data(), count, energyUnit, gains);
 }
 
 }  // namespace morvik::link

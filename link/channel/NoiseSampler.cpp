@@ -12,27 +12,12 @@ namespace {
 
 constexpr int mostSteps = 126;
 
-/// Numbers that are drawn together: few enough to stay in the first-level cache.
+/// Numbers that are drawn together, whole groups: few enough to stay in the first-level cache.
 constexpr std::uint32_t partSize = 4096;
-
-constexpr std::array<std::uint64_t, 64> allOnes()
-{
-    std::array<std::uint64_t, partSize / 64> words{};
-    for (std::uint64_t& word : words) {
-        word = ~std::uint64_t{0};
-    }
-    return words;
-}
-
-/// Byte i % 8 of a word belongs to number i.
-const std::uint8_t* bytesOf(const std::uint64_t* words)
-{
-    return reinterpret_cast<const std::uint8_t*>(words);
-}
 
 }  // namespace
 
-RoundedDistribution coarseNoise()
+AliasTable::Weights coarseNoise()
 {
     // exp(-d^2 / 2 s^2) for s = 18: each is the one before times r^(2 d - 1) with r = exp(-1 / 2 s^2).
     constexpr double r = 0.99845798025952968374;
@@ -46,7 +31,7 @@ RoundedDistribution coarseNoise()
         factor *= r * r;
         sum += 2 * densities[d];
     }
-    RoundedDistribution distribution{};
+    AliasTable::Weights weights{};
     constexpr std::uint64_t all = std::uint64_t{1} << AliasTable::weightBits;
     const double unit = static_cast<double>(all) / sum;
     std::uint64_t given = 0;
@@ -54,16 +39,22 @@ RoundedDistribution coarseNoise()
         const double exact = densities[d] * unit;
         auto weight = static_cast<std::uint64_t>(exact);
         weight += exact - static_cast<double>(weight) >= 0.5 ? 1U : 0U;
-        distribution.weights[d] = weight;
-        distribution.weights[256 - d] = weight;
+        weights[d] = weight;
+        weights[256 - d] = weight;
         given += 2 * weight;
     }
-    distribution.weights[0] = all - given;
-    return distribution;
+    weights[0] = all - given;
+    return weights;
 }
 
 NoiseSampler::NoiseSampler(const RandomKey& key, const SamplerForm& form)
-    : itsCoarse(coarseNoise(), key, form), itsFine(key, form), itsSteps(partSize)
+    : itsTable(coarseNoise()),
+      itsKey(key),
+      itsForm(form),
+      itsRefinements(key, form),
+      itsNumbers(partSize),
+      itsSteps(partSize),
+      itsUndecided(partSize / 64)
 {
 }
 
@@ -71,11 +62,8 @@ void NoiseSampler::draw(const FrameRandom& random, std::uint32_t first, std::uin
 {
     for (std::uint32_t done = 0; done < count; done += partSize) {
         const std::uint32_t now = std::min(partSize, count - done);
-        drawParts(random, first + done, now);
-        for (std::uint32_t i = 0; i < now; ++i) {
-            numbers[done + i] = static_cast<std::int16_t>(256 * itsSteps[i] + bytesOf(itsFine.lows())[i] +
-                                                          bytesOf(itsFine.highs())[i] - 255);
-        }
+        drawPart(random, first + done, now);
+        std::copy_n(itsNumbers.begin(), now, numbers + done);
     }
 }
 
@@ -83,22 +71,43 @@ void NoiseSampler::add(const FrameRandom& random, std::uint32_t first, std::uint
 {
     for (std::uint32_t done = 0; done < count; done += partSize) {
         const std::uint32_t now = std::min(partSize, count - done);
-        drawParts(random, first + done, now);
-        rowKernels().addNoise(
-            itsSteps.data(), bytesOf(itsFine.lows()), bytesOf(itsFine.highs()), now, unit, sums + done);
+        drawPart(random, first + done, now);
+        rowKernels().addNoise(itsNumbers.data(), now, unit, sums + done);
     }
 }
 
-/// Draws d, u and v of up to `partSize` numbers.
-void NoiseSampler::drawParts(const FrameRandom& random, std::uint32_t first, std::uint32_t count)
+/// Draws up to `partSize` numbers.
+void NoiseSampler::drawPart(const FrameRandom& random, std::uint32_t first, std::uint32_t count)
 {
-    static constexpr auto ones = allOnes();
-    std::uint32_t clipped = 0;  // d does not reach the ends
-    itsCoarse.put(random, first, ones.data(), count, itsSteps.data(), clipped);
-    itsCoarse.draw();
-    itsFine.clear();
-    itsFine.put(random.counterLow(random_index::fineNoise + first / 8), random.counterHigh(), (count + 7) / 8);
-    itsFine.draw();
+    const std::size_t groups = (count + 63) / 64;
+    const NoiseCounters counters = {random.counterLow(random_index::softValues + first / 8),
+                                    random.counterLow(random_index::fineNoise + first / 8),
+                                    random.counterHigh()};
+    itsForm.noise(itsTable, itsKey, counters, groups, {itsNumbers.data(), itsSteps.data(), itsUndecided.data()});
+    decide(random, first, groups);
+}
+
+/// Decides steps that are an entry's own for now: one in 256. Each has 32 bits of a random block of its own.
+void NoiseSampler::decide(const FrameRandom& random, std::uint32_t first, std::size_t groups)
+{
+    itsOpen.clear();
+    itsRefinements.clear();
+    for (std::uint32_t g = 0; g < groups; ++g) {
+        for (std::uint64_t left = itsUndecided[g]; left != 0; left &= left - 1) {
+            const std::uint32_t i = 64 * g + static_cast<std::uint32_t>(__builtin_ctzll(left));
+            itsOpen.push_back(i);
+            itsRefinements.put(random.counterLow(random_index::refinements + first + i), random.counterHigh());
+        }
+    }
+    itsRefinements.draw();
+    for (std::size_t n = 0; n < itsOpen.size(); ++n) {
+        const std::uint32_t i = itsOpen[n];
+        const auto entry = static_cast<std::uint8_t>(itsSteps[i]);
+        if ((itsRefinements.low(n) & 0xFFFFFFFF) >= itsTable.lowThreshold[entry]) {
+            const int change = static_cast<std::int8_t>(itsTable.alias[entry]) - itsSteps[i];
+            itsNumbers[i] = static_cast<std::int16_t>(itsNumbers[i] + 256 * change);
+        }
+    }
 }
 
 }  // namespace morvik::link

@@ -9,8 +9,10 @@
 #include <cstdint>
 #include <vector>
 
-#include "SoftValueSampler.h"
+#include "link/random/AliasTable.h"
+#include "link/random/Random.h"
 #include "link/random/RandomBatch.h"
+#include "link/random/SamplerForm.h"
 
 namespace morvik::link {
 
@@ -20,8 +22,8 @@ constexpr double noiseSteps = 4609.1850147286927;
 /// The largest absolute value.
 constexpr int mostNoise = 126 * 256 + 255;
 
-/// The probabilities of d times 2^48, for SoftValueSampler.
-RoundedDistribution coarseNoise();
+/// The probabilities of d times 2^48, those of negative ones in the upper half.
+AliasTable::Weights coarseNoise();
 
 class NoiseSampler {
 public:
@@ -36,11 +38,17 @@ public:
     void add(const FrameRandom& random, std::uint32_t first, std::uint32_t count, float unit, float* sums);
 
 private:
-    void drawParts(const FrameRandom& random, std::uint32_t first, std::uint32_t count);
+    void drawPart(const FrameRandom& random, std::uint32_t first, std::uint32_t count);
+    void decide(const FrameRandom& random, std::uint32_t first, std::size_t groups);
 
-    SoftValueSampler itsCoarse;
-    RandomBatch itsFine;
+    AliasTable itsTable;
+    RandomKey itsKey;
+    SamplerForm itsForm;
+    RandomBatch itsRefinements;
+    std::vector<std::int16_t> itsNumbers;
     std::vector<std::int8_t> itsSteps;
+    std::vector<std::uint64_t> itsUndecided;
+    std::vector<std::uint32_t> itsOpen;  ///< undecided numbers
 };
 
 }  // namespace morvik::link

@@ -138,6 +138,16 @@ void RateMatching::recover(
     });
 }
 
+void RateMatching::place(const std::int8_t* received, unsigned version, std::size_t count, std::int8_t* buffer) const
+{
+    if (count < size()) {
+        std::memset(buffer, 0, size());
+    }
+    forRuns(size(), itsStarts[version], count, [=](unsigned first, std::size_t done, std::size_t now) {
+        std::memcpy(buffer + first, received + done, now);
+    });
+}
+
 void RateMatching::deinterleave(const float* buffer, float filler, const std::array<float*, 3>& streams) const
 {
     const unsigned length = itsK + rules::tailPositions;

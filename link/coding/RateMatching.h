@@ -61,6 +61,9 @@ public:
     void recover(
         const std::int16_t* received, unsigned version, std::size_t count, unsigned width, std::int16_t* buffer) const;
 
+    /// Puts received values, at most size(), into a soft buffer of size() values, and 0 where there are none.
+    void place(const std::int8_t* received, unsigned version, std::size_t count, std::int8_t* buffer) const;
+
     /// Puts values of the circular buffer into the three streams of K + 4 values: filler bits as `filler`, what the
     /// buffer does not hold as 0.
     void deinterleave(const float* buffer, float filler, const std::array<float*, 3>& streams) const;

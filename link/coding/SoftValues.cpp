@@ -7,14 +7,14 @@
 
 namespace morvik::link {
 
-void softValues(const float* ratios, std::size_t count, float scale, std::int8_t* values)
+std::uint32_t softValues(const float* ratios, std::size_t count, float scale, std::int8_t* values)
 {
-    rowKernels().roundToBytes(ratios, count, scale, 128, values);
+    return rowKernels().roundToBytes(ratios, count, scale, 128, values);
 }
 
-void softValues(const float* ratios, std::size_t count, float scale, unsigned width, std::int16_t* values)
+std::uint32_t softValues(const float* ratios, std::size_t count, float scale, unsigned width, std::int16_t* values)
 {
-    rowKernels().roundToWords(ratios, count, scale, static_cast<float>(1U << (width - 1)), values);
+    return rowKernels().roundToWords(ratios, count, scale, static_cast<float>(1U << (width - 1)), values);
 }
 
 void softValues(const std::int16_t* sums, std::size_t count, std::int8_t* values)

@@ -10,11 +10,12 @@ namespace morvik::link {
 /// The soft value of a filler bit: the strongest 0.
 constexpr std::int8_t fillerValue = -128;
 
-/// Ratios times scale, rounded with halves away from 0, clipped to -128 ... 127. NaN becomes -128.
-void softValues(const float* ratios, std::size_t count, float scale, std::int8_t* values);
+/// Ratios times scale, rounded with halves away from 0, clipped to -128 ... 127. NaN becomes -128. Returns how many
+/// were clipped.
+std::uint32_t softValues(const float* ratios, std::size_t count, float scale, std::int8_t* values);
 
 /// The same, clipped to `width` bits, 2 to 16.
-void softValues(const float* ratios, std::size_t count, float scale, unsigned width, std::int16_t* values);
+std::uint32_t softValues(const float* ratios, std::size_t count, float scale, unsigned width, std::int16_t* values);
 
 /// Clips to -128 ... 127.
 void softValues(const std::int16_t* sums, std::size_t count, std::int8_t* values);

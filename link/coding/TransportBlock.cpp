@@ -171,6 +171,23 @@ void TransportBlockCode::recover(const std::int16_t* received,
     }
 }
 
+bool TransportBlockCode::sendsOnce() const
+{
+    for (unsigned r = 0; r < itsBlocks.count; ++r) {
+        if (codedBits(r) > matching(r).size()) {
+            return false;
+        }
+    }
+    return true;
+}
+
+void TransportBlockCode::place(const std::int8_t* received, unsigned version, std::int8_t* buffer) const
+{
+    for (unsigned r = 0; r < itsBlocks.count; ++r) {
+        matching(r).place(received + codedOffset(r), version, codedBits(r), buffer + softOffset(r));
+    }
+}
+
 bool TransportBlockCode::join(const std::uint8_t* decisions, unsigned r, std::uint64_t* row) const
 {
     // Filler bits are known: leading zeros, which no CRC depends on.

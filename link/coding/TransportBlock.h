@@ -95,6 +95,12 @@ public:
     /// The same in whole steps, each sum clipped to `width` bits, 2 to 16.
     void recover(const std::int16_t* received, unsigned version, unsigned width, std::int16_t* buffer) const;
 
+    /// Whether a transmission sends no bit of the circular buffers twice.
+    bool sendsOnce() const;
+
+    /// Puts one transmission that does so into a soft buffer of softSize() values, and 0 for what it does not send.
+    void place(const std::int8_t* received, unsigned version, std::int8_t* buffer) const;
+
     /// Puts the decisions of code block r, a byte each, into a packed row of the transport block and its CRC, and
     /// returns whether the code block's CRC fits: its own or, if it is alone, that of the transport block.
     bool join(const std::uint8_t* decisions, unsigned r, std::uint64_t* row) const;

@@ -26,34 +26,136 @@ void addClipped(const std::int16_t* numbers, std::size_t count, std::int32_t mos
     }
 }
 
-void addNoise(
-    const std::int8_t* d, const std::uint8_t* u, const std::uint8_t* v, std::size_t count, float unit, float* sums)
+void addNoise(const std::int16_t* numbers, std::size_t count, float unit, float* sums)
 {
     for (std::size_t i = 0; i < count; ++i) {
-        sums[i] += static_cast<float>(256 * d[i] + u[i] + v[i] - 255) * unit;
+        sums[i] += static_cast<float>(numbers[i]) * unit;
     }
-}
-
-std::uint32_t countOutside(const float* numbers, std::size_t count, float scale, float low, float high)
-{
-    std::uint32_t outside = 0;
-    for (std::size_t i = 0; i < count; ++i) {
-        const float value = numbers[i] * scale;
-        outside += value > low && value < high ? 0U : 1U;
-    }
-    return outside;
 }
 
 template <typename Integer>
-void roundTo(const float* numbers, std::size_t count, float scale, float end, Integer* rounded)
+std::uint32_t roundTo(const float* numbers, std::size_t count, float scale, float end, Integer* rounded)
 {
+    // The largest float below a half: added to a float below 2^23, it reaches the next integer from a half on.
+    constexpr float almostHalf = 0.49999997F;
+    std::uint32_t clipped = 0;
     for (std::size_t i = 0; i < count; ++i) {
         const float value = numbers[i] * scale;
+        clipped += value > -end - 0.5F && value < end - 0.5F ? 0U : 1U;
         const float above = value > -end ? value : -end;
         const float kept = above < end - 1 ? above : end - 1;
-        const auto whole = static_cast<std::int32_t>(kept);
-        const float rest = kept - static_cast<float>(whole);  // exact
-        rounded[i] = static_cast<Integer>(whole + (rest >= 0.5F ? 1 : 0) - (rest <= -0.5F ? 1 : 0));
+        rounded[i] = static_cast<Integer>(static_cast<std::int32_t>(kept + __builtin_copysignf(almostHalf, kept)));
+    }
+    return clipped;
+}
+
+// ---- Symbols
+
+/// Numbers of `bits` bits each that are mapped at once: their bits fit in 32.
+template <unsigned bits>
+struct Group {
+    static constexpr unsigned count = bits <= 2 ? 16 : 8;
+    static constexpr unsigned size = count * bits;
+
+    typedef std::int32_t Words __attribute__((vector_size(4 * count)));
+    typedef float Numbers __attribute__((vector_size(4 * count)));
+};
+
+/// Shifts that bring the bits of each number, every other one of a symbol's, to bit 0.
+template <unsigned bits>
+void takePlaces(typename Group<bits>::Words& places)
+{
+    for (unsigned n = 0; n < Group<bits>::count; ++n) {
+        places[n] = static_cast<std::int32_t>(n / 2 * 2 * bits + n % 2);
+    }
+}
+
+/// Magnitudes of numbers whose bits stand in every other place, the first one, their sign, lowest.
+template <unsigned bits>
+void takeMagnitudes(const typename Group<bits>::Words& numbers, typename Group<bits>::Numbers& taken)
+{
+    using Words = typename Group<bits>::Words;
+    const Words one = Words{} + 1;
+    // A bit less 1 is all ones or all zeros: of a 0, the sign changes.
+    Words magnitudes = one;
+    for (unsigned i = 1; i < bits; ++i) {
+        const Words turned = (numbers >> 2 * (bits - i) & one) - one;
+        magnitudes = (one << i) + (magnitudes ^ turned) - turned;
+    }
+    taken = __builtin_convertvector(magnitudes, typename Group<bits>::Numbers);
+}
+
+/// Maps a group from bit `first` of a row on. Reads no word without a bit of its first `count` numbers.
+template <unsigned bits>
+void mapGroup(const std::uint64_t* row,
+              std::size_t first,
+              std::size_t count,
+              float unit,
+              const typename Group<bits>::Words& places,
+              typename Group<bits>::Numbers& mapped)
+{
+    using Words = typename Group<bits>::Words;
+    std::uint64_t word = row[first / 64] >> first % 64;
+    if (64 % Group<bits>::size != 0 && first % 64 + count * bits > 64) {
+        word |= row[first / 64 + 1] << (64 - first % 64);
+    }
+    const Words shifted = (Words{} + static_cast<std::int32_t>(word & 0xFFFFFFFF)) >> places;
+    takeMagnitudes<bits>(shifted, mapped);
+    mapped = reinterpret_cast<typename Group<bits>::Numbers>(reinterpret_cast<Words>(mapped * unit) ^ shifted << 31);
+}
+
+template <unsigned bits>
+void mapTo(const std::uint64_t* row, std::size_t count, float unit, float* numbers)
+{
+    constexpr unsigned most = Group<bits>::count;
+    typename Group<bits>::Words places;
+    takePlaces<bits>(places);
+    typename Group<bits>::Numbers mapped;
+    std::size_t n = 0;
+    for (; n + most <= count; n += most) {
+        mapGroup<bits>(row, n * bits, most, unit, places, mapped);
+        __builtin_memcpy(numbers + n, &mapped, sizeof mapped);
+    }
+    if (n < count) {
+        mapGroup<bits>(row, n * bits, count - n, unit, places, mapped);
+        __builtin_memcpy(numbers + n, &mapped, (count - n) * sizeof(float));
+    }
+}
+
+void map(const std::uint64_t* row, unsigned bits, std::size_t count, float unit, float* numbers)
+{
+    switch (bits) {
+    case 1:
+        return mapTo<1>(row, count, unit, numbers);
+    case 2:
+        return mapTo<2>(row, count, unit, numbers);
+    case 3:
+        return mapTo<3>(row, count, unit, numbers);
+    default:
+        return mapTo<4>(row, count, unit, numbers);
+    }
+}
+
+void amplitudes(const std::int16_t* numbers, std::size_t count, float unit, float* roots)
+{
+    for (std::size_t i = 0; i < count; ++i) {
+        const std::int32_t first = numbers[2 * i];
+        const std::int32_t second = numbers[2 * i + 1];
+        roots[i] = __builtin_sqrtf(static_cast<float>(first * first + second * second) * unit);
+    }
+}
+
+void fade(const float* gains, std::size_t symbols, unsigned across, float* numbers)
+{
+    if (across == 1) {
+        for (std::size_t i = 0; i < symbols; ++i) {
+            numbers[i] *= gains[i];
+        }
+        return;
+    }
+    for (std::size_t i = 0; i < symbols; ++i) {
+        numbers[2 * i] *= gains[i];
+        numbers[2 * i + 1] *= gains[i];
     }
 }
 
@@ -337,9 +439,11 @@ const RowKernels kernels = {MORVIK_LINK_SET_NAME,
                             add,
                             addClipped,
                             addNoise,
-                            countOutside,
                             roundTo<std::int8_t>,
                             roundTo<std::int16_t>,
+                            amplitudes,
+                            fade,
+                            map,
                             rowsOfOne,
                             rowsOfTwo,
                             ratios<false>,

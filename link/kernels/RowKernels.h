@@ -33,17 +33,26 @@ struct RowKernels {
     /// Adds, and clips to -most - 1 ... most.
     void (*addClipped)(const std::int16_t* numbers, std::size_t count, std::int32_t most, std::int16_t* sums);
 
-    /// Adds noise: numbers 256 d + u + v - 255, times a unit.
-    void (*addNoise)(
-        const std::int8_t* d, const std::uint8_t* u, const std::uint8_t* v, std::size_t count, float unit, float* sums);
+    /// Adds numbers times a unit.
+    void (*addNoise)(const std::int16_t* numbers, std::size_t count, float unit, float* sums);
 
-    /// How many products with a scale are not between the limits.
-    std::uint32_t (*countOutside)(const float* numbers, std::size_t count, float scale, float low, float high);
+    /// Products with a scale, rounded with halves away from 0, clipped to -end ... end - 1; returns how many are
+    /// clipped. NaN becomes -end, and counts. `end` is at most 128 of bytes, 32768 of words.
+    std::uint32_t (*roundToBytes)(
+        const float* numbers, std::size_t count, float scale, float end, std::int8_t* rounded);
+    std::uint32_t (*roundToWords)(
+        const float* numbers, std::size_t count, float scale, float end, std::int16_t* rounded);
 
-    /// Products with a scale, rounded with halves away from 0, clipped to -end ... end - 1. NaN becomes -end. Of bytes,
-    /// `end` is at most 128.
-    void (*roundToBytes)(const float* numbers, std::size_t count, float scale, float end, std::int8_t* rounded);
-    void (*roundToWords)(const float* numbers, std::size_t count, float scale, float end, std::int16_t* rounded);
+    /// Of pairs of numbers, the amplitudes: the square root of the sum of squares times a unit. The sums fit in 31
+    /// bits.
+    void (*amplitudes)(const std::int16_t* numbers, std::size_t count, float unit, float* roots);
+
+    /// Multiplies the numbers of `across` dimensions, 1 or 2, of each symbol by its gain.
+    void (*fade)(const float* gains, std::size_t symbols, unsigned across, float* numbers);
+
+    /// The numbers of packed bits: `bits` of them, 1 to 4, for each of I and Q in turn; of one dimension, with `bits`
+    /// 1, they are the same. They are (1 - 2 b0) (8 - (1 - 2 b1) (4 - ...)) units, b0 being the first bit.
+    void (*map)(const std::uint64_t* row, unsigned bits, std::size_t count, float unit, float* numbers);
 
     /// Undoes the columns of the sub-block interleaver (3GPP TS 36.212, 5.1.4.1.1): 32 columns of `rows` values, in the
     /// order in which they are sent, become rows of 32. Destroys the columns. The first form has one stream, the second

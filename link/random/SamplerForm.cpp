@@ -64,6 +64,27 @@ void randomBlocksGeneric(const RandomKey& key, std::uint64_t* low, std::uint64_t
     }
 }
 
+void noiseGeneric(const AliasTable& table,
+                  const RandomKey& key,
+                  const NoiseCounters& counters,
+                  std::size_t groups,
+                  const DrawnNoise& drawn)
+{
+    constexpr unsigned allBits = 0xFF;
+    std::fill_n(drawn.undecided, groups, 0);
+    for (std::size_t b = 0; b < 8 * groups; ++b) {
+        std::int8_t* const steps = drawn.steps + 8 * b;
+        const Left8 left = drawBlock(table, randomBlock(key, counters.coarseLow + b, counters.high), allBits, steps);
+        drawn.undecided[b / 8] |= std::uint64_t{left.undecided} << 8 * (b % 8);
+        const RandomBlock fine = randomBlock(key, counters.fineLow + b, counters.high);
+        for (unsigned i = 0; i < 8; ++i) {
+            const auto u = static_cast<int>(fine[i / 4] >> 8 * (i % 4) & 0xFF);
+            const auto v = static_cast<int>(fine[2 + i / 4] >> 8 * (i % 4) & 0xFF);
+            drawn.numbers[8 * b + i] = static_cast<std::int16_t>(256 * steps[i] + u + v - 255);
+        }
+    }
+}
+
 }  // namespace
 
 std::vector<SamplerForm> samplerForms()
@@ -73,13 +94,13 @@ std::vector<SamplerForm> samplerForms()
     __builtin_cpu_init();
     if (__builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
         __builtin_cpu_supports("avx512vbmi")) {
-        forms.push_back({"avx512", drawAvx512, randomBlocksAvx512});
+        forms.push_back({"avx512", drawAvx512, randomBlocksAvx512, noiseAvx512});
     }
     if (__builtin_cpu_supports("avx2")) {
-        forms.push_back({"avx2", drawAvx2, randomBlocksAvx2});
+        forms.push_back({"avx2", drawAvx2, randomBlocksAvx2, noiseAvx2});
     }
 #endif
-    forms.push_back({"generic", drawGeneric, randomBlocksGeneric});
+    forms.push_back({"generic", drawGeneric, randomBlocksGeneric, noiseGeneric});
     return forms;
 }
 

@@ -26,6 +26,21 @@ struct ValueGroup {
     std::uint64_t ends;       ///< the value was -128 or 127 before negation
 };
 
+/// The counters of noise: words 0 and 1 of the first random blocks of d and of u and v, and words 2 and 3 of all.
+struct NoiseCounters {
+    std::uint64_t coarseLow;
+    std::uint64_t fineLow;
+    std::uint64_t high;
+};
+
+/// Numbers of noise, 64 for each group: 256 d + u + v - 255. Eight of them have a random block of d, which is drawn as
+/// the values of a ValueGroup are, and one of u and v, its bytes 0 to 7 and 8 to 15.
+struct DrawnNoise {
+    std::int16_t* numbers;
+    std::int8_t* steps;        ///< d
+    std::uint64_t* undecided;  ///< of each group, as above
+};
+
 /// One implementation of drawing in bulk.
 struct SamplerForm {
     const char* name;
@@ -35,6 +50,13 @@ struct SamplerForm {
 
     /// Replaces counters by their random blocks: words 0 and 1, and words 2 and 3.
     void (*randomBlocks)(const RandomKey& key, std::uint64_t* low, std::uint64_t* high, std::size_t count);
+
+    /// Draws `groups` groups of noise from consecutive blocks.
+    void (*noise)(const AliasTable& table,
+                  const RandomKey& key,
+                  const NoiseCounters& counters,
+                  std::size_t groups,
+                  const DrawnNoise& drawn);
 };
 
 /// The forms that this machine can run, the best one first. The last one, "generic", runs everywhere; all give the same

@@ -104,19 +104,33 @@ MORVIK_AVX512 MORVIK_INLINE __m512i lookUp(const Table512& table, __m512i entrie
                                 _mm512_permutex2var_epi8(table.quarter[2], entries, table.quarter[3]));
 }
 
+/// Values, and which of them are undecided.
+struct Values512 {
+    __m512i values;
+    __mmask64 undecided;
+};
+
+MORVIK_AVX512 MORVIK_INLINE Values512 valuesOf(const Table512& thresholds,
+                                               const Table512& aliases,
+                                               const Random512& random)
+{
+    const __mmask64 upper = _mm512_movepi8_mask(random.low);
+    const __m512i threshold = lookUp(thresholds, random.low, upper);
+    const __mmask64 own = _mm512_cmple_epu8_mask(random.high, threshold);
+    return {_mm512_mask_mov_epi8(lookUp(aliases, random.low, upper), own, random.low),
+            _mm512_cmpeq_epu8_mask(random.high, threshold)};
+}
+
 MORVIK_AVX512 MORVIK_INLINE void drawGroup(const Table512& thresholds,
                                            const Table512& aliases,
                                            const Random512& random,
                                            ValueGroup& group)
 {
-    const __mmask64 upper = _mm512_movepi8_mask(random.low);
-    const __m512i threshold = lookUp(thresholds, random.low, upper);
-    const __mmask64 own = _mm512_cmple_epu8_mask(random.high, threshold);
-    const __m512i value = _mm512_mask_mov_epi8(lookUp(aliases, random.low, upper), own, random.low);
+    const auto [value, undecided] = valuesOf(thresholds, aliases, random);
     const __m512i sent = _mm512_mask_sub_epi8(value, ~group.bits, _mm512_setzero_si512(), value);
     const __mmask64 used = lowBits(group.count);
     _mm512_mask_storeu_epi8(group.values, used, sent);
-    group.undecided = _mm512_cmpeq_epu8_mask(random.high, threshold) & used;
+    group.undecided = undecided & used;
     group.ends = _mm512_cmplt_epi8_mask(_mm512_add_epi8(value, _mm512_set1_epi8(1)), _mm512_set1_epi8(-126)) & used;
 }
 
@@ -135,6 +149,47 @@ MORVIK_AVX512 MORVIK_INLINE void drawGroups(const RoundKeys& keys,
     philox(keys, random);
     for (std::size_t g = 0; g < count; ++g) {
         drawGroup(thresholds, aliases, random[g], groups[g]);
+    }
+}
+
+MORVIK_AVX512 MORVIK_INLINE __m512i countersFrom(std::uint64_t first, __m512i order)
+{
+    return _mm512_add_epi64(_mm512_set1_epi64(static_cast<long long>(first)), order);
+}
+
+/// Numbers of noise. Bytes become words by unpacking, which takes the even and then the odd blocks: so the fine blocks
+/// are drawn, and the steps put, in an order that unpacks to that of the numbers.
+template <std::size_t count>
+MORVIK_AVX512 MORVIK_INLINE void noiseGroups(const RoundKeys& keys,
+                                             const Table512& thresholds,
+                                             const Table512& aliases,
+                                             const NoiseCounters& counters,
+                                             const DrawnNoise& drawn,
+                                             std::size_t group)
+{
+    const __m512i inOrder = _mm512_setr_epi64(0, 1, 2, 3, 4, 5, 6, 7);
+    const __m512i unpacked = _mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7);
+    const __m512i high = _mm512_set1_epi64(static_cast<long long>(counters.high));
+    Random512 random[2 * count];
+    for (std::size_t g = 0; g < count; ++g) {
+        random[2 * g] = {countersFrom(counters.coarseLow + 8 * (group + g), inOrder), high};
+        random[2 * g + 1] = {countersFrom(counters.fineLow + 8 * (group + g), unpacked), high};
+    }
+    philox(keys, random);
+    for (std::size_t g = 0; g < count; ++g) {
+        const auto [values, undecided] = valuesOf(thresholds, aliases, random[2 * g]);
+        const Random512& fine = random[2 * g + 1];
+        const __m512i steps = _mm512_permutexvar_epi64(unpacked, values);
+        const __m512i less = _mm512_andnot_si512(fine.high, _mm512_set1_epi8(-1));  // 255 - v
+        std::int16_t* const numbers = drawn.numbers + 64 * (group + g);
+        _mm512_storeu_si512(numbers,
+                            _mm512_sub_epi16(_mm512_unpacklo_epi8(fine.low, steps),
+                                             _mm512_unpacklo_epi8(less, _mm512_setzero_si512())));
+        _mm512_storeu_si512(numbers + 32,
+                            _mm512_sub_epi16(_mm512_unpackhi_epi8(fine.low, steps),
+                                             _mm512_unpackhi_epi8(less, _mm512_setzero_si512())));
+        _mm512_storeu_si512(drawn.steps + 64 * (group + g), values);
+        drawn.undecided[group + g] = undecided;
     }
 }
 
@@ -176,6 +231,24 @@ MORVIK_AVX512 void randomBlocksAvx512(const RandomKey& key, std::uint64_t* low, 
         philox(keys, random);
         _mm512_mask_storeu_epi64(low + done, used, random[0].low);
         _mm512_mask_storeu_epi64(high + done, used, random[0].high);
+    }
+}
+
+MORVIK_AVX512 void noiseAvx512(const AliasTable& table,
+                               const RandomKey& key,
+                               const NoiseCounters& counters,
+                               std::size_t groups,
+                               const DrawnNoise& drawn)
+{
+    const RoundKeys keys(key);
+    const Table512 thresholds = loadTable512(table.highThreshold);
+    const Table512 aliases = loadTable512(table.alias);
+    std::size_t done = 0;
+    for (; done + 4 <= groups; done += 4) {
+        noiseGroups<4>(keys, thresholds, aliases, counters, drawn, done);
+    }
+    for (; done < groups; ++done) {
+        noiseGroups<1>(keys, thresholds, aliases, counters, drawn, done);
     }
 }
 
@@ -249,6 +322,20 @@ MORVIK_AVX2 MORVIK_INLINE std::uint64_t maskOf(__m256i bytes)
     return static_cast<std::uint32_t>(_mm256_movemask_epi8(bytes));
 }
 
+/// Values, and which of them are undecided.
+struct Values256 {
+    __m256i values;
+    std::uint64_t undecided;
+};
+
+MORVIK_AVX2 MORVIK_INLINE Values256 valuesOf(const AliasTable& table, const Random256& random)
+{
+    const __m256i threshold = lookUp(table.highThreshold, random.low);
+    const __m256i own = _mm256_cmpeq_epi8(_mm256_min_epu8(random.high, threshold), random.high);
+    return {_mm256_blendv_epi8(lookUp(table.alias, random.low), random.low, own),
+            maskOf(_mm256_cmpeq_epi8(random.high, threshold))};
+}
+
 /// The masks left to the caller, for 32 values.
 struct Left32 {
     std::uint64_t undecided;
@@ -261,13 +348,31 @@ MORVIK_AVX2 MORVIK_INLINE Left32 drawHalf(const AliasTable& table,
                                           std::uint32_t bits,
                                           std::int8_t* values)
 {
-    const __m256i threshold = lookUp(table.highThreshold, random.low);
-    const __m256i own = _mm256_cmpeq_epi8(_mm256_min_epu8(random.high, threshold), random.high);
-    const __m256i value = _mm256_blendv_epi8(lookUp(table.alias, random.low), random.low, own);
+    const auto [value, undecided] = valuesOf(table, random);
     const __m256i negated = bytesOfZeros(bits);
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(values), _mm256_sub_epi8(_mm256_xor_si256(value, negated), negated));
-    return {maskOf(_mm256_cmpeq_epi8(random.high, threshold)),
-            maskOf(_mm256_cmpgt_epi8(_mm256_set1_epi8(-126), _mm256_add_epi8(value, _mm256_set1_epi8(1))))};
+    return {undecided, maskOf(_mm256_cmpgt_epi8(_mm256_set1_epi8(-126), _mm256_add_epi8(value, _mm256_set1_epi8(1))))};
+}
+
+MORVIK_AVX2 MORVIK_INLINE __m256i countersFrom(std::uint64_t first, __m256i order)
+{
+    return _mm256_add_epi64(_mm256_set1_epi64x(static_cast<long long>(first)), order);
+}
+
+/// Half a group of noise, as above. Returns which values are undecided.
+MORVIK_AVX2 MORVIK_INLINE std::uint64_t noiseHalf(
+    const AliasTable& table, const Random256& coarse, const Random256& fine, std::int16_t* numbers, std::int8_t* steps)
+{
+    const auto [values, undecided] = valuesOf(table, coarse);
+    const __m256i unpacked = _mm256_permute4x64_epi64(values, 0xD8);
+    const __m256i zero = _mm256_setzero_si256();
+    const __m256i less = _mm256_andnot_si256(fine.high, _mm256_set1_epi8(-1));  // 255 - v
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(steps), values);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(numbers),
+                        _mm256_sub_epi16(_mm256_unpacklo_epi8(fine.low, unpacked), _mm256_unpacklo_epi8(less, zero)));
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(numbers + 16),
+                        _mm256_sub_epi16(_mm256_unpackhi_epi8(fine.low, unpacked), _mm256_unpackhi_epi8(less, zero)));
+    return undecided;
 }
 
 }  // namespace
@@ -303,6 +408,29 @@ MORVIK_AVX2 void randomBlocksAvx2(const RandomKey& key, std::uint64_t* low, std:
         philox(keys, random);
         _mm256_maskstore_epi64(lows, used, random[0].low);
         _mm256_maskstore_epi64(highs, used, random[0].high);
+    }
+}
+
+MORVIK_AVX2 void noiseAvx2(const AliasTable& table,
+                           const RandomKey& key,
+                           const NoiseCounters& counters,
+                           std::size_t groups,
+                           const DrawnNoise& drawn)
+{
+    const RoundKeys keys(key);
+    const __m256i high = _mm256_set1_epi64x(static_cast<long long>(counters.high));
+    for (std::size_t g = 0; g < groups; ++g) {
+        const std::uint64_t coarse = counters.coarseLow + 8 * g;
+        const std::uint64_t fine = counters.fineLow + 8 * g;
+        Random256 random[] = {{countersFrom(coarse, _mm256_setr_epi64x(0, 1, 2, 3)), high},
+                              {countersFrom(coarse, _mm256_setr_epi64x(4, 5, 6, 7)), high},
+                              {countersFrom(fine, _mm256_setr_epi64x(0, 2, 1, 3)), high},
+                              {countersFrom(fine, _mm256_setr_epi64x(4, 6, 5, 7)), high}};
+        philox(keys, random);
+        std::int16_t* const numbers = drawn.numbers + 64 * g;
+        std::int8_t* const steps = drawn.steps + 64 * g;
+        drawn.undecided[g] = noiseHalf(table, random[0], random[2], numbers, steps) |
+                             noiseHalf(table, random[1], random[3], numbers + 32, steps + 32) << 32;
     }
 }
 

@@ -43,7 +43,7 @@ class EveryNoiseSampler : public testing::TestWithParam<SamplerForm> {};
 
 TEST(NoiseSamplerTest, CoarseNoiseIsADiscreteGaussian)
 {
-    const AliasTable::Weights weights = coarseNoise().weights;
+    const AliasTable::Weights weights = coarseNoise();
     EXPECT_EQ(std::accumulate(weights.begin(), weights.end(), std::uint64_t{0}),
               std::uint64_t{1} << AliasTable::weightBits);
     double variance = 0;
@@ -62,7 +62,7 @@ TEST(NoiseSamplerTest, CoarseNoiseIsADiscreteGaussian)
 TEST_P(EveryNoiseSampler, NumbersAreThoseOfTheDefinition)
 {
     NoiseSampler sampler(key, GetParam());
-    const AliasTable table(coarseNoise().weights);
+    const AliasTable table(coarseNoise());
     const FrameRandom random(key, 3, 0x123456789A);
     const std::vector<std::int16_t> numbers = numbersOf(sampler, random, 9001);
     for (std::uint32_t i = 0; i < numbers.size(); ++i) {

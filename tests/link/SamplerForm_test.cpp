@@ -136,6 +136,45 @@ TEST_P(EverySamplerForm, DrawsAnyNumberOfGroups)
     }
 }
 
+TEST_P(EverySamplerForm, DrawsTheNoiseOfTheDefinition)
+{
+    const SamplerForm form = GetParam();
+    std::mt19937_64 random(2);
+    std::uint64_t undecidedAtAll = 0;
+    for (const AliasTable& table : tables()) {
+        const RandomKey key = randomKey(random());
+        for (const std::size_t groups : {0U, 1U, 2U, 3U, 4U, 900U}) {
+            const NoiseCounters counters = {random(), random(), random()};
+            std::vector<std::int16_t> numbers(64 * groups + 64, guard);
+            std::vector<std::int8_t> steps(64 * groups + 64, guard);
+            std::vector<std::uint64_t> undecided(groups + 1, guard);
+            form.noise(table, key, counters, groups, {numbers.data(), steps.data(), undecided.data()});
+            for (std::size_t i = 0; i < 64 * groups; ++i) {
+                const RandomBlock coarse = randomBlock(key, counters.coarseLow + i / 8, counters.high);
+                const RandomBlock fine = randomBlock(key, counters.fineLow + i / 8, counters.high);
+                const auto byte = [i](const RandomBlock& block, unsigned half) {
+                    return block[2 * half + i % 8 / 4] >> 8 * (i % 4) & 0xFF;
+                };
+                const unsigned entry = byte(coarse, 0);
+                const unsigned threshold = table.highThreshold[entry];
+                const auto step = static_cast<std::int8_t>(byte(coarse, 1) > threshold ? table.alias[entry] : entry);
+                ASSERT_EQ(steps[i], step) << i;
+                ASSERT_EQ(undecided[i / 64] >> i % 64 & 1, byte(coarse, 1) == threshold ? 1U : 0U) << i;
+                const int number = 256 * step + static_cast<int>(byte(fine, 0) + byte(fine, 1)) - 255;
+                ASSERT_EQ(numbers[i], static_cast<std::int16_t>(number)) << i;
+            }
+            for (std::size_t g = 0; g < groups; ++g) {
+                undecidedAtAll |= undecided[g];
+            }
+            EXPECT_TRUE(
+                std::all_of(&numbers[64 * groups], &numbers[64 * groups] + 64, [](int n) { return n == guard; }));
+            EXPECT_TRUE(std::all_of(&steps[64 * groups], &steps[64 * groups] + 64, [](int n) { return n == guard; }));
+            EXPECT_EQ(undecided[groups], std::uint64_t{guard});
+        }
+    }
+    EXPECT_EQ(undecidedAtAll, ~std::uint64_t{0}) << "every place has been undecided once";
+}
+
 INSTANTIATE_TEST_SUITE_P(Forms, EverySamplerForm, everySamplerForm(), samplerFormName);
 
 TEST(SamplerForm, TheMachinesFormsAreNamedAndEndWithTheGenericOne)

@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 #include <limits>
@@ -107,29 +108,98 @@ TEST(RowKernelsTest, AddAndRoundAlike)
     }
 }
 
-TEST(RowKernelsTest, AddNoiseAndCountAlike)
+TEST(RowKernelsTest, RoundAsTheMathematicalLibraryAndCountWhatIsClipped)
+{
+    // Around every integer and half in range, and beyond its ends.
+    std::vector<float> numbers = {std::numeric_limits<float>::quiet_NaN(), 1e30F, -1e30F, -0.0F};
+    for (int twice = -2 * 32770; twice <= 2 * 32770; ++twice) {
+        const float middle = static_cast<float>(twice) / 2;
+        const float below = std::nextafter(middle, -1e9F);
+        const float above = std::nextafter(middle, 1e9F);
+        numbers.insert(numbers.end(),
+                       {std::nextafter(below, -1e9F), below, middle, above, std::nextafter(above, 1e9F)});
+    }
+    for (const float end : {2.0F, 32.0F, 128.0F, 32768.0F}) {
+        std::vector<std::int16_t> expected;
+        std::uint32_t expectedClipped = 0;
+        for (const float number : numbers) {
+            const float rounded = std::round(number);
+            const bool isKept = rounded >= -end && rounded <= end - 1;
+            expectedClipped += isKept ? 0U : 1U;
+            expected.push_back(static_cast<std::int16_t>(isKept ? rounded : rounded > 0 ? end - 1 : -end));
+        }
+        for (const RowKernels* const set : rowKernelSets()) {
+            std::vector<std::int16_t> words(numbers.size());
+            EXPECT_EQ(set->roundToWords(numbers.data(), numbers.size(), 1, end, words.data()), expectedClipped)
+                << set->name << ' ' << end;
+            EXPECT_EQ(words, expected) << set->name << ' ' << end;
+            if (end <= 128) {
+                std::vector<std::int8_t> bytes(numbers.size());
+                EXPECT_EQ(set->roundToBytes(numbers.data(), numbers.size(), 1, end, bytes.data()), expectedClipped);
+                EXPECT_TRUE(std::equal(bytes.begin(), bytes.end(), expected.begin())) << set->name << ' ' << end;
+            }
+        }
+    }
+}
+
+TEST(RowKernelsTest, AddNoiseAndFadeAlike)
 {
     Random random(4);
     for (std::size_t count = 0; count < 200; count += 11) {
-        const std::vector<float> start = randomNumbers(random, count);
-        const auto d = randomIntegers<std::int8_t>(random, count);
-        const auto u = randomIntegers<std::uint8_t>(random, count);
-        const auto v = randomIntegers<std::uint8_t>(random, count);
-        expectSame([&](const RowKernels& set) {
-            std::vector<float> to = start;
-            set.addNoise(d.data(), u.data(), v.data(), count, 0.1F, to.data());
-            return to;
-        });
+        const std::vector<float> start = randomNumbers(random, 2 * count);
+        const std::vector<float> gains = randomNumbers(random, count);
+        auto integers = randomIntegers<std::int16_t>(random, 2 * count);
+        for (std::int16_t& integer : integers) {
+            integer = std::max<std::int16_t>(integer, -32511);
+        }
         for (const RowKernels* const set : rowKernelSets()) {
-            std::uint32_t outside = 0;
-            for (const float number : start) {
-                outside += number * 3 <= -20.5F || number * 3 >= 30 ? 1U : 0U;
+            std::vector<float> sums = start;
+            std::vector<float> faded = start;
+            std::vector<float> fadedOnes(start.begin(), start.begin() + static_cast<std::ptrdiff_t>(count));
+            std::vector<float> roots(count);
+            set->addNoise(integers.data(), 2 * count, 0.1F, sums.data());
+            set->fade(gains.data(), count, 2, faded.data());
+            set->fade(gains.data(), count, 1, fadedOnes.data());
+            set->amplitudes(integers.data(), count, 1e-7F, roots.data());
+            for (std::size_t i = 0; i < count; ++i) {
+                const std::int32_t a = integers[2 * i];
+                const std::int32_t b = integers[2 * i + 1];
+                const float noise = static_cast<float>(a) * 0.1F;
+                EXPECT_EQ(sums[2 * i], start[2 * i] + noise) << set->name;
+                EXPECT_EQ(faded[2 * i], start[2 * i] * gains[i]) << set->name;
+                EXPECT_EQ(faded[2 * i + 1], start[2 * i + 1] * gains[i]) << set->name;
+                EXPECT_EQ(fadedOnes[i], start[i] * gains[i]) << set->name;
+                EXPECT_EQ(roots[i], std::sqrt(static_cast<float>(a * a + b * b) * 1e-7F)) << set->name;
             }
-            EXPECT_EQ(set->countOutside(start.data(), count, 3, -20.5F, 30), outside) << set->name;
         }
     }
-    const std::vector<float> ends = {-8, 8, 7.9375F, -7.9375F, std::numeric_limits<float>::quiet_NaN()};
-    EXPECT_EQ(rowKernels().countOutside(ends.data(), ends.size(), 1, -8, 8), 3U) << "the limits are outside, as is NaN";
+}
+
+TEST(RowKernelsTest, MapBitsOfAnyNumberOfSymbols)
+{
+    Random random(5);
+    for (unsigned bits = 1; bits <= 4; ++bits) {
+        for (std::size_t count = 0; count < 300; count += 2) {
+            const auto row = randomIntegers<std::uint64_t>(random, (count * bits + 63) / 64);
+            std::vector<float> expected;
+            for (std::size_t n = 0; n < count; ++n) {
+                const auto sign = [&](unsigned i) {
+                    const std::size_t bit = n / 2 * 2 * bits + n % 2 + std::size_t{2} * i;
+                    return (row[bit / 64] >> bit % 64 & 1) != 0 ? -1 : 1;
+                };
+                int level = 1;
+                for (unsigned i = bits - 1; i > 0; --i) {
+                    level = (1 << (bits - i)) - sign(i) * level;
+                }
+                expected.push_back(static_cast<float>(sign(0) * level) * 0.3F);
+            }
+            for (const RowKernels* const set : rowKernelSets()) {
+                std::vector<float> numbers(count);
+                set->map(row.data(), bits, count, 0.3F, numbers.data());
+                EXPECT_EQ(numbers, expected) << set->name << ' ' << bits << ' ' << count;
+            }
+        }
+    }
 }
 
 TEST(RowKernelsTest, MakeRowsOfColumnsAlike)
