@@ -1,7 +1,6 @@
 // TransportCheck: compares decisions with the code blocks that were sent, and checks their CRCs.
 #include "TransportCheck.h"
 
-#include "link/coding/Crc.h"
 #include "link/coding/PackedBits.h"
 
 namespace morvik::simulation {
@@ -58,10 +57,15 @@ bool TransportCheck::fits(unsigned frame, const std::vector<Decisions>& others) 
     return code.fits(row.data());
 }
 
+void TransportCheck::sentBits(unsigned frame, unsigned r, std::uint8_t* bits) const
+{
+    link::unpackBits(sent(frame, r), itsSource.code().blocks().size(r), bits);
+}
+
 std::vector<std::uint8_t> TransportCheck::sentBits(unsigned frame, unsigned r) const
 {
     std::vector<std::uint8_t> bits(itsSource.code().blocks().size(r));
-    link::unpackBits(sent(frame, r), bits.size(), bits.data());
+    sentBits(frame, r, bits.data());
     return bits;
 }
 

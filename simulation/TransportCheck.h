@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "link/TransportSource.h"
+#include "link/coding/Crc.h"
 
 namespace morvik::simulation {
 
@@ -32,7 +33,15 @@ public:
     using Decisions = std::pair<unsigned, std::vector<std::uint8_t>>;
     bool fits(unsigned frame, const std::vector<Decisions>& others) const;
 
-    /// The bits of code block r, filler bits and CRC included.
+    /// Whether the CRC of code block r can fit although so many of its decisions are wrong, filler bits included. Where
+    /// it cannot, all of them are outside of those.
+    bool canMiss(unsigned r, std::uint32_t wrongBits) const
+    {
+        return wrongBits > 0 && (itsSource.code().blocks().fillersOf(r) > 0 || link::crcCanMiss(wrongBits));
+    }
+
+    /// The bits of code block r, filler bits and CRC included: K bytes.
+    void sentBits(unsigned frame, unsigned r, std::uint8_t* bits) const;
     std::vector<std::uint8_t> sentBits(unsigned frame, unsigned r) const;
 
 private:

@@ -72,7 +72,7 @@ void TransportSimulator::simulate(std::uint64_t first, std::uint32_t count, Batc
     } else {
         for (unsigned t = 0; t < itsPoint.link.versions.size() && !open.empty(); ++t) {
             transmit(open, t, clipped);
-            decode(open, itsPoint.iterations);
+            decode(open);
             open.erase(
                 std::remove_if(open.begin(), open.end(), [this](unsigned frame) { return itsFrames[frame].fits; }),
                 open.end());
@@ -110,12 +110,19 @@ void TransportSimulator::transmit(const std::vector<unsigned>& frames,
     }
 }
 
-/// Decodes all frames, which have had one transmission, with each number of iterations anew.
+/// Judges all frames, which have had one transmission, after each iteration.
 void TransportSimulator::decodeEachIteration(const std::vector<unsigned>& frames, BatchResult& result)
 {
+    for (std::size_t kind = 0; kind < itsBatches.size(); ++kind) {
+        judgeEachIteration(itsBatches.at(kind), itsJudgements.at(kind));
+    }
     std::vector<BatchResult> results(itsPoint.iterations);
     for (unsigned i = 0; i < itsPoint.iterations; ++i) {
-        decode(frames, i + 1);
+        begin(frames);
+        for (std::size_t kind = 0; kind < itsBatches.size(); ++kind) {
+            countAfter(i + 1, itsBatches.at(kind), itsJudgements.at(kind));
+        }
+        conclude(frames);
         append(results[i]);
         for (Frame& frame : itsFrames) {
             frame.reception.iterations = 0;
@@ -129,8 +136,73 @@ void TransportSimulator::decodeEachIteration(const std::vector<unsigned>& frames
     }
 }
 
-/// Decodes the code blocks of a transmission's frames and checks their CRCs.
-void TransportSimulator::decode(const std::vector<unsigned>& frames, unsigned iterations)
+/// The decoder counts wrong bits after each iteration while it decodes, but gives decisions at its end only. They are
+/// needed where a CRC may fit in spite of errors: these code blocks are decoded anew.
+void TransportSimulator::judgeEachIteration(const link::CodeBlockBatch& batch, std::vector<Judgement>& judgements)
+{
+    const std::size_t blocks = batch.places.size();
+    judgements.assign(blocks * itsPoint.iterations, {});
+    if (blocks == 0) {
+        return;
+    }
+    itsSent.resize(blocks * batch.K);
+    for (std::size_t b = 0; b < blocks; ++b) {
+        itsCheck.sentBits(batch.places[b].frame, batch.places[b].block, &itsSent[b * batch.K]);
+    }
+    itsWrongBits.resize(judgements.size());
+    coreOf(batch).countErrors(batch.streams, batch.K, blocks, itsPoint.iterations, itsSent, itsWrongBits.data());
+    for (unsigned i = 0; i < itsPoint.iterations; ++i) {
+        itsAnew.clear();
+        for (std::size_t b = 0; b < blocks; ++b) {
+            const std::uint32_t wrong = itsWrongBits[b * itsPoint.iterations + i];
+            judgements[b * itsPoint.iterations + i].verdict = {wrong, wrong == 0};
+            if (itsCheck.canMiss(batch.places[b].block, wrong)) {
+                itsAnew.push_back(b);
+            }
+        }
+        judgeAnew(batch, i + 1, judgements);
+    }
+}
+
+void TransportSimulator::judgeAnew(const link::CodeBlockBatch& batch,
+                                   unsigned iterations,
+                                   std::vector<Judgement>& judgements)
+{
+    if (itsAnew.empty()) {
+        return;
+    }
+    const std::size_t length = batch.K + rules::tailPositions;
+    for (std::size_t s = 0; s < batch.streams.size(); ++s) {
+        std::vector<std::int8_t>& stream = itsOpen.streams.at(s);
+        stream.resize(itsAnew.size() * length);
+        for (std::size_t i = 0; i < itsAnew.size(); ++i) {
+            std::copy_n(&batch.streams.at(s)[itsAnew[i] * length], length, &stream[i * length]);
+        }
+    }
+    coreOf(batch).decode(itsOpen.streams, batch.K, itsAnew.size(), iterations, itsDecided);
+    for (std::size_t i = 0; i < itsAnew.size(); ++i) {
+        judgements[itsAnew[i] * itsPoint.iterations + iterations - 1] =
+            judged(batch.places[itsAnew[i]], &itsDecided[i * batch.K]);
+    }
+}
+
+/// Counts the decisions of that iteration or, with early stop, of an earlier one whose CRC fits.
+void TransportSimulator::countAfter(unsigned iterations,
+                                    const link::CodeBlockBatch& batch,
+                                    const std::vector<Judgement>& judgements)
+{
+    for (std::size_t b = 0; b < batch.places.size(); ++b) {
+        const Judgement* const own = &judgements[b * itsPoint.iterations];
+        unsigned last = itsPoint.link.stopsEarly ? 1 : iterations;
+        while (last < iterations && !own[last - 1].verdict.fits) {
+            last += 1;
+        }
+        count(batch.places[b], own[last - 1], last);
+    }
+}
+
+/// Forgets what is known of the frames' last transmission.
+void TransportSimulator::begin(const std::vector<unsigned>& frames)
 {
     for (const unsigned number : frames) {
         Frame& frame = itsFrames[number];
@@ -139,11 +211,23 @@ void TransportSimulator::decode(const std::vector<unsigned>& frames, unsigned it
         frame.fits = true;
         frame.undetected.clear();
     }
+}
+
+/// Decodes the code blocks of a transmission's frames and checks their CRCs.
+void TransportSimulator::decode(const std::vector<unsigned>& frames)
+{
+    begin(frames);
     for (const link::CodeBlockBatch& batch : itsBatches) {
         if (!batch.places.empty()) {
-            itsPoint.link.stopsEarly ? decodeUntilItFits(batch, iterations) : decodeBatch(batch, iterations);
+            itsPoint.link.stopsEarly ? decodeUntilItFits(batch) : decodeBatch(batch);
         }
     }
+    conclude(frames);
+}
+
+/// Checks the CRCs of transport blocks whose code blocks have been counted.
+void TransportSimulator::conclude(const std::vector<unsigned>& frames)
+{
     for (const unsigned number : frames) {
         Frame& frame = itsFrames[number];
         // A code block that is alone has the transport block's CRC.
@@ -158,24 +242,26 @@ Core& TransportSimulator::coreOf(const link::CodeBlockBatch& batch)
     return batch.K == itsPoint.blockSize ? itsCore : itsSmallCore;
 }
 
-void TransportSimulator::decodeBatch(const link::CodeBlockBatch& batch, unsigned iterations)
+void TransportSimulator::decodeBatch(const link::CodeBlockBatch& batch)
 {
-    coreOf(batch).decode(batch.streams, batch.K, batch.places.size(), iterations, itsDecided);
+    coreOf(batch).decode(batch.streams, batch.K, batch.places.size(), itsPoint.iterations, itsDecided);
     for (std::size_t i = 0; i < batch.places.size(); ++i) {
-        judge(batch.places[i], &itsDecided[i * batch.K], iterations, true);
+        count(batch.places[i], judged(batch.places[i], &itsDecided[i * batch.K]), itsPoint.iterations);
     }
 }
 
 /// Decodes with one iteration, then what does not fit with two, and so on.
-void TransportSimulator::decodeUntilItFits(const link::CodeBlockBatch& batch, unsigned iterations)
+void TransportSimulator::decodeUntilItFits(const link::CodeBlockBatch& batch)
 {
     itsOpen = batch;
     const std::size_t length = batch.K + rules::tailPositions;
-    for (unsigned i = 1; i <= iterations && !itsOpen.places.empty(); ++i) {
+    for (unsigned i = 1; i <= itsPoint.iterations && !itsOpen.places.empty(); ++i) {
         coreOf(batch).decode(itsOpen.streams, batch.K, itsOpen.places.size(), i, itsDecided);
         std::size_t kept = 0;
         for (std::size_t b = 0; b < itsOpen.places.size(); ++b) {
-            if (judge(itsOpen.places[b], &itsDecided[b * batch.K], i, i == iterations)) {
+            const Judgement judgement = judged(itsOpen.places[b], &itsDecided[b * batch.K]);
+            if (judgement.verdict.fits || i == itsPoint.iterations) {
+                count(itsOpen.places[b], judgement, i);
                 continue;
             }
             if (kept < b) {
@@ -190,25 +276,29 @@ void TransportSimulator::decodeUntilItFits(const link::CodeBlockBatch& batch, un
     }
 }
 
-/// Counts the decisions on a code block if its CRC fits or if they are the last. Returns whether it has counted them.
-bool TransportSimulator::judge(const link::CodeBlockBatch::Place& place,
-                               const std::uint8_t* decided,
-                               unsigned iterations,
-                               bool isLast)
+TransportSimulator::Judgement TransportSimulator::judged(const link::CodeBlockBatch::Place& place,
+                                                         const std::uint8_t* decided)
 {
-    const BlockVerdict verdict = itsCheck.check(place.frame, place.block, decided);
-    if (!verdict.fits && !isLast) {
-        return false;
+    Judgement judgement = {itsCheck.check(place.frame, place.block, decided), {}};
+    if (judgement.verdict.fits && judgement.verdict.wrongBits > 0) {
+        judgement.undetected.assign(decided, decided + itsSource.code().blocks().size(place.block));
     }
+    return judgement;
+}
+
+/// Adds the decisions on a code block to what is known of its frame.
+void TransportSimulator::count(const link::CodeBlockBatch::Place& place,
+                               const Judgement& judgement,
+                               unsigned iterations)
+{
     Frame& frame = itsFrames[place.frame];
-    frame.wrongBits += verdict.wrongBits;
-    frame.reception.codeBlockErrors += verdict.wrongBits > 0 ? 1 : 0;
+    frame.wrongBits += judgement.verdict.wrongBits;
+    frame.reception.codeBlockErrors += judgement.verdict.wrongBits > 0 ? 1 : 0;
     frame.reception.iterations += iterations;
-    frame.fits = frame.fits && verdict.fits;
-    if (verdict.fits && verdict.wrongBits > 0) {
-        frame.undetected.push_back({place.block, {decided, decided + itsSource.code().blocks().size(place.block)}});
+    frame.fits = frame.fits && judgement.verdict.fits;
+    if (!judgement.undetected.empty()) {
+        frame.undetected.push_back({place.block, judgement.undetected});
     }
-    return true;
 }
 
 void TransportSimulator::append(BatchResult& result) const

@@ -32,13 +32,25 @@ private:
         std::vector<TransportCheck::Decisions> undetected;  // on code blocks that are wrong, but whose CRC fits
     };
 
+    /// The decisions on a code block after an iteration.
+    struct Judgement {
+        BlockVerdict verdict;
+        std::vector<std::uint8_t> undetected;  // the decisions, if they are wrong, but the CRC fits
+    };
+
     void transmit(const std::vector<unsigned>& frames, unsigned transmission, std::vector<std::uint32_t>& clipped);
-    void decode(const std::vector<unsigned>& frames, unsigned iterations);
+    void begin(const std::vector<unsigned>& frames);
+    void decode(const std::vector<unsigned>& frames);
+    void conclude(const std::vector<unsigned>& frames);
     void decodeEachIteration(const std::vector<unsigned>& frames, BatchResult& result);
+    void judgeEachIteration(const link::CodeBlockBatch& batch, std::vector<Judgement>& judgements);
+    void judgeAnew(const link::CodeBlockBatch& batch, unsigned iterations, std::vector<Judgement>& judgements);
+    void countAfter(unsigned iterations, const link::CodeBlockBatch& batch, const std::vector<Judgement>& judgements);
     Core& coreOf(const link::CodeBlockBatch& batch);
-    void decodeBatch(const link::CodeBlockBatch& batch, unsigned iterations);
-    void decodeUntilItFits(const link::CodeBlockBatch& batch, unsigned iterations);
-    bool judge(const link::CodeBlockBatch::Place& place, const std::uint8_t* decided, unsigned iterations, bool isLast);
+    void decodeBatch(const link::CodeBlockBatch& batch);
+    void decodeUntilItFits(const link::CodeBlockBatch& batch);
+    Judgement judged(const link::CodeBlockBatch::Place& place, const std::uint8_t* decided);
+    void count(const link::CodeBlockBatch::Place& place, const Judgement& judgement, unsigned iterations);
     void append(BatchResult& result) const;
 
     const Plan& itsPlan;
@@ -51,6 +63,12 @@ private:
     link::CodeBlockBatch itsOpen;  // code blocks whose CRC has not fitted yet
     std::vector<Frame> itsFrames;
     std::vector<std::uint8_t> itsDecided;
+
+    // If errors are counted after each iteration: of each code block of a batch, those after each.
+    std::array<std::vector<Judgement>, 2> itsJudgements;
+    std::vector<std::uint8_t> itsSent;
+    std::vector<std::uint32_t> itsWrongBits;
+    std::vector<std::size_t> itsAnew;  // code blocks that are decoded anew
 };
 
 }  // namespace morvik::simulation

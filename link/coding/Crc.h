@@ -17,6 +17,13 @@ constexpr unsigned crcBits = 24;
 std::uint32_t crc24a(const std::uint64_t* row, std::size_t first, std::size_t count);
 std::uint32_t crc24b(const std::uint64_t* row, std::size_t first, std::size_t count);
 
+/// Whether one of these CRCs can fit although `wrong` of up to 2^23 - 1 bits, parity included, are. Both generators are
+/// D + 1 times a primitive polynomial of degree 23, so odd numbers of errors, and two, always show.
+constexpr bool crcCanMiss(std::size_t wrong)
+{
+    return wrong >= 4 && wrong % 2 == 0;
+}
+
 }  // namespace morvik::link
 
 #endif

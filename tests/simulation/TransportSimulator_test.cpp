@@ -204,20 +204,40 @@ TEST(TransportSimulator, FailsSmallBlocksUndetected)
     }
 }
 
-TEST(TransportSimulator, CountsAfterEachIteration)
+/// Compares the counts after each iteration with those of runs with as many iterations.
+void expectAsDecodingAnew(const LinkFormat& format, int milliEsn0, unsigned iterations)
 {
-    Plan plan = planOf(threeBlocks(), 8300, 3);
+    constexpr std::uint32_t frames = 70;
+    Plan plan = planOf(format, milliEsn0, iterations);
     plan.eachIteration = true;
-    const BatchResult all = resultOf(plan, 7, 70);
-    ASSERT_EQ(all.wrongBits.size(), 210U);
-    for (unsigned iterations = 1; iterations <= 3; ++iterations) {
-        const BatchResult one = resultOf(planOf(threeBlocks(), 8300, iterations), 7, 70);
+    const BatchResult all = resultOf(plan, 7, frames);
+    ASSERT_EQ(all.wrongBits.size(), std::size_t{frames} * iterations);
+    unsigned failed = 0;
+    for (unsigned i = 1; i <= iterations; ++i) {
+        const BatchResult one = resultOf(planOf(format, milliEsn0, i), 7, frames);
         EXPECT_EQ(one.clipped, all.clipped);
-        for (std::size_t i = 0; i < 70; ++i) {
-            ASSERT_EQ(all.wrongBits[3 * i + iterations - 1], one.wrongBits[i]);
-            ASSERT_TRUE(all.receptions[3 * i + iterations - 1] == one.receptions[i]);
+        for (std::size_t f = 0; f < frames; ++f) {
+            ASSERT_EQ(all.wrongBits[iterations * f + i - 1], one.wrongBits[f]) << f << " after " << i;
+            ASSERT_TRUE(all.receptions[iterations * f + i - 1] == one.receptions[f]) << f << " after " << i;
+            failed += one.wrongBits[f] > 0 ? 1U : 0U;
         }
     }
+    EXPECT_GT(failed, frames);
+    EXPECT_LT(failed, frames * iterations);
+}
+
+TEST(TransportSimulator, CountsAfterEachIterationWhatDecodingAnewGives)
+{
+    LinkFormat format = threeBlocks();
+    expectAsDecodingAnew(format, 9300, 4);
+    format.stopsEarly = true;
+    expectAsDecodingAnew(format, 9300, 4);
+    format.transportBlockSize = 1000;  // alone, without filler bits
+    format.codedBits = 2000;
+    expectAsDecodingAnew(format, 7500, 4);
+    format.stopsEarly = false;
+    format.transportBlockSize = 999;  // and with them
+    expectAsDecodingAnew(format, 7500, 4);
 }
 
 TEST(TransportSimulator, ResultsTravel)

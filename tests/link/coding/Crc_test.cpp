@@ -3,6 +3,8 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 #include "link/coding/PackedBits.h"
 #include "support/Blocks.h"
 #include "support/PlainLink.h"
@@ -57,4 +59,31 @@ TEST(CrcTest, DoesNotDependOnLeadingZeros)
     morvik::plain::Bits longer(61, 0);
     longer.insert(longer.end(), bits.begin(), bits.end());
     EXPECT_EQ(crc24b(packed(longer).data(), 0, longer.size()), crc24b(packed(bits).data(), 0, bits.size()));
+}
+
+TEST(CrcTest, SeesOddNumbersOfErrorsAndTwo)
+{
+    // What the remainder of D^i - 1 does not see, no CRC sees of two errors that are i bits apart.
+    for (const auto crc : {crc24a, crc24b}) {
+        std::uint64_t row[128] = {1};
+        for (std::size_t i = 1; i < 64 * 128 - 1; ++i) {
+            row[i / 64] |= std::uint64_t{1} << i % 64;
+            ASSERT_NE(crc(row, 0, i + 1), 0U) << i;
+            row[i / 64] &= ~(std::uint64_t{1} << i % 64);
+        }
+    }
+    Random random(4);
+    for (unsigned i = 0; i < 1000; ++i) {
+        const morvik::plain::Bits bits = morvik::blocks::randomBits(random, 200);
+        if (std::count(bits.begin(), bits.end(), 1) % 2 != 0) {
+            EXPECT_NE(crc24a(packed(bits).data(), 0, bits.size()), 0U);
+            EXPECT_NE(crc24b(packed(bits).data(), 0, bits.size()), 0U);
+        }
+    }
+    for (const std::size_t seen : {1U, 2U, 3U, 5U, 6143U}) {
+        EXPECT_FALSE(morvik::link::crcCanMiss(seen)) << seen;
+    }
+    for (const std::size_t missed : {4U, 6U, 6144U}) {
+        EXPECT_TRUE(morvik::link::crcCanMiss(missed)) << missed;
+    }
 }
