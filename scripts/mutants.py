@@ -48,6 +48,19 @@ PLACES = {
     "lanes/Rules.h": None,
     "lanes/Transpose.h": None,
     "lanes/Words.h": None,
+    "link/coding/BitMatrix.h": None,
+    "link/coding/CodeBlocks.cpp": None,
+    "link/coding/Crc.cpp": None,
+    "link/coding/PackedBits.cpp": None,
+    "link/coding/PackedBits.h": None,
+    "link/coding/RateMatching.cpp": None,
+    "link/coding/SoftValues.cpp": None,
+    "link/coding/TransportBlock.cpp": None,
+    "link/coding/TurboEncoder.cpp": None,
+    "link/modulation/Demapper.cpp": None,
+    "link/modulation/Mapper.cpp": None,
+    "link/modulation/Modulation.cpp": None,
+    "link/modulation/Modulation.h": None,
 }
 
 # Replacements: operators with a space on both sides or at the end of their line, and words.
@@ -123,6 +136,14 @@ EQUIVALENT = {
           ("copies[i] < -32768", "copies[i] <= -32768"), ("copies[i] > 32767", "copies[i] >= 32767")]),
         ("of an index word, the low five bits alone count",
          [("control[2 * lane + 1] = 0", "control[2 * lane + 1] = 1")]),
+    ],
+    "link/coding/RateMatching.cpp": [
+        ("arrays with an element more", [("mostPositions = 6176", "mostPositions = 6177")]),
+        ("positions 0 and 1 of a stream are dummy bits in every block size",
+         [("written + 1 : 0", "written + 1 : 1"), ("unsigned i = 1; i < total", "unsigned i = 0; i < total")]),
+    ],
+    "link/coding/TurboEncoder.cpp": [
+        ("the interleaver with an element more", [("unsigned i = 0; i < K", "unsigned i = 0; i <= K")]),
     ],
 }
 

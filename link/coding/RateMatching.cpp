@@ -90,11 +90,12 @@ RateMatching::RateMatching(unsigned K, unsigned fillers, unsigned bufferSize) : 
         const unsigned k0 = itsRows * (2 * ((total + 8 * itsRows - 1) / (8 * itsRows)) * version + 2);
         itsStarts[version] = bitsBefore(k0 % total) % bitsBefore(total);
     }
-    for (unsigned i = 0; i < total; ++i) {
+    // Position 0 is a dummy bit in every block size.
+    for (unsigned i = 1; i < total; ++i) {
         if (buffer[i] == null) {
             continue;
         }
-        if (i == 0 || buffer[i - 1] == null) {
+        if (buffer[i - 1] == null) {
             itsRuns.push_back({static_cast<std::uint16_t>(itsPositions.size()), static_cast<std::uint16_t>(i), 0});
         }
         itsPositions.push_back(buffer[i]);

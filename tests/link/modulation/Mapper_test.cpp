@@ -121,6 +121,21 @@ TEST(MapperTest, TakesTheBitsOfARowInTheirOrder)
     }
 }
 
+TEST(MapperTest, IgnoresTheBitsBehindItsSymbols)
+{
+    const std::uint64_t row = ~std::uint64_t{0};
+    for (const Modulation modulation : morvik::link::modulations) {
+        const std::string ones(morvik::link::bitsPerSymbol(modulation), '1');
+        const unsigned numbers = morvik::link::dimensions(modulation);
+        std::array<float, 14> symbols{};
+        morvik::link::mapSymbols(modulation, &row, 7, symbols.data());
+        for (unsigned n = 0; n < 7; ++n) {
+            EXPECT_EQ(symbols[std::size_t{numbers} * n], symbolOf(modulation, ones).real())
+                << nameOf(modulation) << ' ' << n;
+        }
+    }
+}
+
 TEST(ModulationTest, HasNames)
 {
     for (const Modulation modulation : morvik::link::modulations) {
