@@ -108,16 +108,28 @@ TEST(MapperTest, SymbolsHaveMeanEnergyOne)
 
 TEST(MapperTest, TakesTheBitsOfARowInTheirOrder)
 {
-    // Of two words: symbols of six bits cross from one to the other.
-    const std::array<std::uint64_t, 2> row = {0xFEDCBA9876543210, 0x0F1E2D3C4B5A6978};
-    std::array<float, 42> together{};
-    morvik::link::mapSymbols(Modulation::qam64, row.data(), 21, together.data());
-    for (unsigned n = 0; n < 21; ++n) {
-        std::string bits;
-        for (unsigned i = 6 * n; i < 6 * n + 6; ++i) {
-            bits += (row[i / 64] >> i % 64 & 1) != 0 ? '1' : '0';
+    // Of eight words: symbols of six bits cross from one to the next.
+    std::array<std::uint64_t, 8> row{};
+    std::uint64_t word = 0xFEDCBA9876543210;
+    for (std::uint64_t& bits : row) {
+        bits = word;
+        word = word * 6364136223846793005U + 1442695040888963407U;
+    }
+    for (const Modulation modulation : morvik::link::modulations) {
+        const unsigned perSymbol = morvik::link::bitsPerSymbol(modulation);
+        const unsigned numbers = morvik::link::dimensions(modulation);
+        const unsigned symbols = 508 / perSymbol;
+        std::vector<float> together(std::size_t{symbols} * numbers);
+        morvik::link::mapSymbols(modulation, row.data(), symbols, together.data());
+        for (unsigned n = 0; n < symbols; ++n) {
+            std::string bits;
+            for (unsigned i = perSymbol * n; i < perSymbol * (n + 1); ++i) {
+                bits += (row[i / 64] >> i % 64 & 1) != 0 ? '1' : '0';
+            }
+            const double imaginary = numbers == 2 ? together[std::size_t{2} * n + 1] : 0.0;
+            EXPECT_EQ(symbolOf(modulation, bits), std::complex<double>(together[std::size_t{numbers} * n], imaginary))
+                << nameOf(modulation) << ' ' << n;
         }
-        EXPECT_EQ(symbolOf(Modulation::qam64, bits), std::complex<double>(together[2 * n], together[2 * n + 1])) << n;
     }
 }
 
