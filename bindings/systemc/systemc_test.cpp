@@ -9,6 +9,7 @@
 #include <systemc>
 #include <vector>
 
+#include "MorvikChecker.h"
 #include "MorvikDecoder.h"
 #include "conformance/Cases.h"
 
@@ -70,6 +71,52 @@ void refuse(Rig& rig, const MorvikSoftBlock& block, const std::string& expected)
     expect("report", lastReport, expected);
 }
 
+void expectAnswer(int got, int answer, const std::string& report)
+{
+    expect("answer", std::to_string(got), std::to_string(answer));
+    expect("report", lastReport.substr(0, lastReport.find('\n')), report);
+    lastReport.clear();
+}
+
+/// What a checker refuses, and x. Reports are kept.
+void checkChecker()
+{
+    const MorvikSoftBlock block = zeros(44);
+    MorvikChecker one(2, 1);
+    const std::string noBlock =
+        "morvik: ERROR:checker:There is no block: start comes before values are observed or asked for";
+    lastReport.clear();
+    expectAnswer(one.observe(MORVIK_CHECKER_LLR, 0, 0, 0), MORVIK_CHECKER_REFUSED, noBlock);
+    expectAnswer(one.report(), MORVIK_CHECKER_REFUSED, noBlock);
+    expectAnswer(one.start(block.sys, block.par1, {}, 8),
+                 MORVIK_CHECKER_REFUSED,
+                 "morvik: The streams differ in length: sys has 44 values, par1 44, par2 0");
+    expectAnswer(one.start(block.sys, block.par1, block.par2, 16),
+                 MORVIK_CHECKER_REFUSED,
+                 "morvik: ERROR:checker:16 iterations are not allowed, expected 1 to 15");
+    expectAnswer(one.start(block.sys, block.par1, block.par2, 1), MORVIK_CHECKER_AGREES, "");
+    expectAnswer(one.observeRow(MORVIK_CHECKER_G, 0, 0, std::array<std::int32_t, 8>{}),
+                 MORVIK_CHECKER_REFUSED,
+                 "morvik: Signal 1 has no row of 8 values: MORVIK_CHECKER_G has 4, MORVIK_CHECKER_ALPHA and "
+                 "MORVIK_CHECKER_BETA have 8");
+    MorvikChecker other(8, 1);
+    expectAnswer(other.start(block.sys, block.par1, block.par2, 1), MORVIK_CHECKER_AGREES, "");
+    const int ratio = one.ratio(3);
+    expect("ratio", std::to_string(one.value(MORVIK_CHECKER_LLR, 1, 3)), std::to_string(ratio));
+    expectAnswer(one.observe(MORVIK_CHECKER_LLR, 1, 3, sc_dt::sc_lv<12>(ratio)), MORVIK_CHECKER_AGREES, "");
+    expectAnswer(one.report(true),
+                 MORVIK_CHECKER_AGREES,
+                 "morvik: block 0: compared 1 of 2 half-iterations, 1 of 1862 "
+                 "values: all equal to the model");
+    expectAnswer(one.report(), MORVIK_CHECKER_INCOMPLETE, "morvik: ERROR:checker:Values are missing");
+    expectAnswer(
+        one.observe(MORVIK_CHECKER_LLR, 1, 4, sc_dt::sc_lv<12>("0000000x0000")),
+        MORVIK_CHECKER_DIFFERS,
+        "morvik: ERROR:checker:llr of half-iteration 1, step 4: expected " + std::to_string(one.ratio(4)) + ", got x");
+    expect("seen", std::to_string(one.seen(MORVIK_CHECKER_LLR)), "2");
+    expect("seen by the other", std::to_string(other.seen(MORVIK_CHECKER_LLR)), "0");
+}
+
 }  // namespace
 
 int sc_main(int argc, char* argv[])
@@ -119,6 +166,7 @@ int sc_main(int argc, char* argv[])
            lastReport,
            "morvik: WARNING:decoder:RSC1 parity value in position 9 saturated positively, further saturation will not "
            "be reported");
+    checkChecker();
     std::cout << cases.size() << " blocks, " << failures << " failures\n";
     return failures == 0 ? 0 : 1;
 }
