@@ -9,6 +9,7 @@
 #include <utility>
 
 #include "Arrays.h"
+#include "Checker.h"
 #include "Decoder.h"
 #include "Link.h"
 #include "Lte.h"
@@ -137,6 +138,7 @@ PYBIND11_MODULE(_core, module)
         throw py::error_already_set();
     }
     addDecoder(module);
+    addChecker(module);
     addLink(module);
     addLte(module);
     addSimulation(module);

@@ -17,16 +17,19 @@ from morvik import _core
 _core.expect_main_interpreter()  # an import does not check this again for a module that is already loaded
 
 from morvik import lte
+from morvik._checker import Checker
 from morvik._core import __version__
 from morvik._decoder import Decoded, Decoder, instruction_sets
-from morvik._errors import DecoderWarning, Error
+from morvik._errors import DecoderWarning, Difference, Error
 from morvik._link import Streams, awgn, block_sizes, encode, interleaver
 from morvik._simulation import error_rate
 
 __all__ = [
+    "Checker",
     "Decoded",
     "Decoder",
     "DecoderWarning",
+    "Difference",
     "Error",
     "Streams",
     "__version__",

@@ -119,7 +119,7 @@ class Decoder:
 
         The interpreter lock is released meanwhile. No other thread may write to the arrays.
         """
-        streams = _streams(sys, par1, par2)
+        streams = streams_of(sys, par1, par2)
         is_single = streams[0].ndim == 1
         rows = [np.require(stream.reshape(-1, stream.shape[-1]), requirements=("C", "A")) for stream in streams]
         tags = _tags(tag, 1 if is_single else len(streams[0]), is_single)
@@ -187,7 +187,7 @@ class Decoder:
         raise TypeError("a morvik.Decoder cannot be copied or pickled: make another one, in the process that uses it")
 
 
-def _streams(*values: npt.ArrayLike) -> list[npt.NDArray[Any]]:
+def streams_of(*values: npt.ArrayLike) -> list[npt.NDArray[Any]]:
     """The three streams, with a common shape and type."""
     names = ("sys", "par1", "par2")
     arrays = [_soft_values(name, value) for name, value in zip(names, values)]

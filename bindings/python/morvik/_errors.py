@@ -6,6 +6,10 @@ Error.__module__ = "morvik"
 Error.__doc__ = """The decoder refuses something, for the reason that the text gives. A ``ValueError``, too."""
 
 
+class Difference(AssertionError):
+    """A core's value differs from the model: the first one that a :class:`morvik.Checker` has met in a block."""
+
+
 class DecoderWarning(UserWarning):
     """A warning of the decoder, such as for the first clipped soft value. Each kind comes once in a decoder's life;
     ``warnings.filterwarnings("error", category=morvik.DecoderWarning)`` makes it an exception.

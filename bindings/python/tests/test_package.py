@@ -33,7 +33,7 @@ def test_stubs_tell_what_the_module_has(tmp_path):
     config = tmp_path / "mypy.ini"
     config.write_text(f"[mypy]\ncache_dir = {tmp_path}\n")
     metaclasses = tmp_path / "metaclasses"  # pybind11 has one of its own
-    metaclasses.write_text("".join(f"morvik._core.{name}\n" for name in ("Decoder", "LinkOptions", "StopRules", "Sweep", "Transport")))
+    metaclasses.write_text("".join(f"morvik._core.{name}\n" for name in ("Checker", "Decoder", "LinkOptions", "StopRules", "Sweep", "Transport")))
     options = ["--ignore-positional-only", "--mypy-config-file", str(config), "--allowlist", str(metaclasses)]
     run("-m", "mypy.stubtest", *options, "morvik._core")
 
