@@ -6,8 +6,7 @@
 
 namespace morvik::vectors {
 
-/// Returns 64 hexadecimal digits, computed by sha256sum of the GNU core utilities. Throws base::Error, also if it is no
-/// regular file.
+/// Returns 64 hexadecimal digits (FIPS 180-4). Throws base::Error, also if it is no regular file.
 std::string sha256(const std::string& fileName);
 
 }  // namespace morvik::vectors
