@@ -37,7 +37,7 @@ int clippedTo(int value, int bits)
     return rules::clip(value, -end, end - eighth);
 }
 
-/// A branch metric or extrinsic value as held in eight bits, in eighths (rules 5 and 14).
+/// A branch metric or extrinsic value, an aligned word, narrowed to eight bits (rules 5 and 14).
 int narrowed(int value, Mistake mistake)
 {
     switch (mistake.kind) {
@@ -52,6 +52,15 @@ int narrowed(int value, Mistake mistake)
     default:
         return rules::clip(value, rules::branchSmallest, rules::branchLargest);
     }
+}
+
+/// The first pass over the code of this pass.
+unsigned firstPassOf(unsigned pass)
+{
+    while (!rules::isFirstPass(pass)) {
+        pass = rules::passBefore(pass);
+    }
+    return pass;
 }
 
 /// The bits by which words are shifted up so that they wrap like narrower registers.
@@ -382,7 +391,7 @@ std::optional<unsigned> Replay::borderPass(unsigned pass, bool ofThisPass, Mista
     case Mistake::borderLate:
         return rules::isFirstPass(right) ? std::nullopt : std::optional(rules::passBefore(right));
     case Mistake::borderOfFirstPass:
-        return pass % 2;
+        return firstPassOf(pass);
     default:
         return right;
     }

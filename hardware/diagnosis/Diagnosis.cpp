@@ -197,7 +197,7 @@ private:
         if (appearance.all().certainty() < related || appearance.amplitude <= 0) {
             return;
         }
-        // Types 0 and 1 do well with any amplitude around 8 steps; type 2 needs 8 / variance for amplitude 1.
+        // Types 0 and 1 do well with any amplitude around 8; type 2 needs 8 / variance for amplitude 1.
         const bool isExact = itsOptions.generics.C_ALGORITHM_TYPE == 2 && variance > 0;
         const double suitable = isExact ? 8 * appearance.amplitude * appearance.amplitude / variance : 8;
         const int doublings = static_cast<int>(std::lround(std::log2(appearance.amplitude / suitable)));
@@ -252,7 +252,7 @@ private:
         const auto K = static_cast<double>(noise.blockSize);
         const double amplitude = std::max(diagnosis.appearance.amplitude, 1e-3);
         const double variance = std::max(diagnosis.appearance.power - amplitude * amplitude, 1e-3);
-        noise.ebn0 = 10 * std::log10((3 * K + 12) / (2 * K) * amplitude * amplitude / variance);
+        noise.ebn0 = 10 * std::log10((3 * K + rules::tailValues) / (2 * K) * amplitude * amplitude / variance);
         noise.simulated = simulatedBlocks;
         noise.failed = simulatedFailures(
             itsOptions, static_cast<unsigned>(noise.blockSize), noise.ebn0, amplitude, simulatedBlocks);

@@ -11,7 +11,6 @@ namespace morvik::diagnosis {
 
 namespace {
 
-constexpr std::size_t tailRows = 4;
 using Stream = std::vector<std::int32_t>;
 
 /// 1 for a value that favours the bit, -1 for one that contradicts it.
@@ -21,12 +20,14 @@ int agreement(std::int32_t value, std::uint8_t bit)
     return bit != 0 ? sign : -sign;
 }
 
+using TailSums = std::array<long long, rules::tailValues>;
+
 /// Sums of agreements, which give those of any columns, signs and tail, as each value's agreement is independent of the
 /// others.
 struct Agreements {
-    std::array<std::array<long long, 3>, 3> data{};    ///< [column of the file][stream]
-    std::array<std::array<long long, 12>, 12> tail{};  ///< [place of the file's tail][the standard's place]
-    long long all = 0;                                 ///< values
+    std::array<std::array<long long, 3>, 3> data{};  ///< [column of the file][stream]
+    std::array<TailSums, rules::tailValues> tail{};  ///< [place of the file's tail][the standard's place]
+    long long all = 0;                               ///< values
 
     void add(const Case& block)
     {
@@ -41,8 +42,8 @@ struct Agreements {
                 }
             }
         }
-        for (std::size_t place = 0; place < 12; ++place) {
-            for (std::size_t right = 0; right < 12; ++right) {
+        for (std::size_t place = 0; place < rules::tailValues; ++place) {
+            for (std::size_t right = 0; right < rules::tailValues; ++right) {
                 tail[place][right] += agreement((*columns[place % 3])[K + place / 3], bits[right % 3][K + right / 3]);
             }
         }

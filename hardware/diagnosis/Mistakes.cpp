@@ -11,7 +11,6 @@ namespace {
 
 using Stream = std::vector<std::int32_t>;
 
-constexpr std::size_t tailRows = 4;
 constexpr const char* columnNames[] = {"rsc1_sys", "rsc1_par", "rsc2_par"};
 
 std::array<Stream*, 3> streamsOf(SoftBlock& block)
@@ -39,11 +38,11 @@ void reverseBytes(std::vector<std::uint8_t>& bits)
     }
 }
 
-void restoreTail(SoftBlock& block, const std::array<std::uint8_t, 12>& contents)
+void restoreTail(SoftBlock& block, const TailContents& contents)
 {
     const std::size_t K = block.size() - tailRows;
     const auto streams = streamsOf(block);
-    std::array<std::int32_t, 12> values{};
+    std::array<std::int32_t, rules::tailValues> values{};
     for (std::size_t place = 0; place < contents.size(); ++place) {
         values[contents[place]] = (*streams[place % 3])[K + place / 3];
     }
@@ -158,11 +157,11 @@ Explanation explainScale(int doublings)
     if (doublings < 0) {
         return {"scale",
                 "the scale is missing or too small: values are about " + factor + " times too small",
-                "Multiply by " + factor + " before rounding: an amplitude of 8 suits, in steps of the file."};
+                "Multiply by " + factor + " before rounding: the amplitude in the file should be 8."};
     }
     return {"scale",
             "the scale is doubled or too large: values are about " + factor + " times too large",
-            "Divide by " + factor + ": an amplitude of 8 suits, in steps of the file."};
+            "Divide by " + factor + ": the amplitude in the file should be 8."};
 }
 
 }  // namespace

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "hardware/testbench/SoftBlock.h"
+#include "rules/Tail.h"
 
 namespace morvik::diagnosis {
 
@@ -47,9 +48,15 @@ constexpr std::array<Order, 6> allOrders{Order::right,
 constexpr std::array<std::array<std::uint8_t, 3>, 6> columnContents{
     {{0, 1, 2}, {0, 2, 1}, {1, 0, 2}, {2, 1, 0}, {1, 2, 0}, {2, 0, 1}}};
 
-/// The tail in the file's last four rows, row by row. Values are numbered as the standard puts them (3GPP TS 36.212,
+/// Rows of a block in a file that carry the tail, after the K others.
+constexpr std::size_t tailRows = rules::tailPositions;
+
+/// Tail values by their number in the standard, in the order of a file's tail rows.
+using TailContents = std::array<std::uint8_t, rules::tailValues>;
+
+/// The orders of the tail in files. Values are numbered as the standard puts them (3GPP TS 36.212,
 /// clause 5.1.3.2.2): x z x z x z of the first encoder, then of the second. The first entry is right.
-constexpr std::array<std::array<std::uint8_t, 12>, 6> tailContents{{
+constexpr std::array<TailContents, 6> tailContents{{
     {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11},
     {0, 1, 7, 2, 3, 9, 4, 5, 11, 6, 8, 10},  // each stream goes on: x z z' of each step, then the three x'
     {0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11},  // column by column

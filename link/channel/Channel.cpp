@@ -6,6 +6,8 @@
 
 #include <cmath>
 
+#include "rules/Tail.h"
+
 namespace morvik::link {
 
 namespace {
@@ -37,7 +39,7 @@ std::uint64_t share(long double part, long double whole)
 
 long double noiseDeviation(unsigned K, int milliDecibels)
 {
-    const long double rate = static_cast<long double>(K) / (3.0L * K + 12);
+    const long double rate = static_cast<long double>(K) / (3.0L * K + rules::tailValues);
     const long double ratio = std::pow(10.0L, milliDecibels / 10000.0L);
     return 1 / std::sqrt(2 * rate * ratio);  // for energy 1 per transmitted value
 }
