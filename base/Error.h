@@ -13,7 +13,7 @@ public:
     using std::runtime_error::runtime_error;
 };
 
-/// "FILE: cannot be ACTION: REASON", with the operating system's reason for errno.
+/// "FILE: cannot be ACTION: REASON", with the text of errno.
 Error fileError(const std::string& file, const std::string& action);
 
 }  // namespace morvik::base

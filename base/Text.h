@@ -10,7 +10,7 @@
 
 namespace morvik::base {
 
-/// Some programs write it at the beginning of UTF-8 text.
+/// Written by some programs at the beginning of UTF-8 text.
 constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
 
 inline std::string_view withoutMark(std::string_view text)

@@ -17,7 +17,7 @@ static int noise(void)
     return sum / 2 - 255;
 }
 
-/* Sends bits 0 as -8 steps over a channel whose noise has a standard deviation of 9.2 steps. */
+/* Sends bits 0 as -8 over a channel whose noise has a standard deviation of 9.2. */
 static void receive(int8_t* values)
 {
     for (int i = 0; i < blocks * (K + 4); ++i)

@@ -13,7 +13,7 @@ int main(void)
     if (state == NULL)
         return 1; /* the reason stands on the standard error stream */
 
-    /* All bits 0 is a code word: sent as -1, that is -8 steps, here with every tenth value received wrong. */
+    /* All bits 0 is a code word: sent as -1, a soft value of -8, here with every tenth value received wrong. */
     int32_t sys[K + 4], par1[K + 4], par2[K + 4];
     for (int i = 0; i < K + 4; ++i) {
         sys[i] = i % 10 == 0 ? 8 : -8;

@@ -19,7 +19,7 @@ struct Received {
     std::vector<Block> sys, par1, par2;
 };
 
-/// Bits 0, sent as -8 steps over a channel with a noise standard deviation of 9.2 steps: a sum of four bytes is close
+/// Bits 0, sent as -8 over a channel with a noise standard deviation of 9.2: a sum of four bytes is close
 /// enough to a Gaussian value, and the same everywhere.
 Block receive(std::mt19937& random)
 {

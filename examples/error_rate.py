@@ -10,7 +10,7 @@ K, BLOCKS, EBN0_DB = 512, 5000, [0.6, 0.8, 1.0]
 
 
 def received(streams, variance, rng):
-    """The part for your own channel and receiver: here BPSK, noise, and a converter of 4 bits, whose steps are 4 of 8."""
+    """The part for your own channel and receiver: here BPSK, noise, and a 4-bit converter in units of half the amplitude."""
     for stream in streams:
         values = 2.0 * stream - 1 + rng.normal(0, variance**0.5, stream.shape)
         yield 4 * np.clip(np.round(2 * values), -8, 7).astype(np.int8)

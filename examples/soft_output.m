@@ -5,7 +5,7 @@ K = 40;
 bits = mod((0:K - 1)' .^ 2, 7) < 3;
 [sys, par1, par2] = morvik_encode(bits);
 
-received = int8(16 * [sys, par1, par2] - 8);  % bit 0 as -8 steps, bit 1 as 8
+received = int8(16 * [sys, par1, par2] - 8);  % bit 0 as -8, bit 1 as 8
 for stream = 1:3
     received(stream:9:end, stream) = -received(stream:9:end, stream);
 end

@@ -1,6 +1,7 @@
 /** @file
  * The LTE chain around the turbo decoder, for C (C99) and C++: CRC, segmentation, turbo code, rate matching,
- * modulation, and the receiving side of each. The library libmorvik_link has them; it needs no other one of morvik's.
+ * modulation, and the receiving side of each. The library libmorvik_link implements it; it needs no other library of
+ * morvik.
  *
  * The chain is that of 3GPP TS 36.212 (V10), clauses 5.1.1 to 5.1.5, and 3GPP TS 36.211 (V12), clauses 7.1.2 to 7.1.5:
  *
@@ -8,7 +9,7 @@
  *     soft values of the core <- rate recovery, sums of transmissions <- log-likelihood ratios <- received symbols
  *
  * The functions named morvik_link_transport_... do all of the first line but modulation for whole transport blocks,
- * those before them one step each. What a decoder needs in between comes from morvik_v1_0_batch.h, whose arrays are
+ * those before them one stage each. What a decoder needs in between comes from morvik_v1_0_batch.h, whose arrays are
  * laid out as they are here.
  *
  * @par Example: a transport block of 1000 bits in 1500 bits of QPSK, and its soft values for the core
@@ -25,11 +26,11 @@
  *     morvik_link_transport_destroy(transport);
  *
  * @par Arrays
- *   All arrays are the caller's, of the size that a function states, in rows one after the other: with `blocks` blocks,
- *   "K values of each" means blocks * K values. Arrays that are read may not overlap those that are written. `blocks`
- *   and `count` may be 0: an array without values may be null, and where nothing is to be done, the status is
- *   MORVIK_LINK_OK unless another argument is wrong. Bits are bytes of 0 or 1, the first one sent first; of other bytes
- *   the lowest bit counts.
+ *   The caller owns all arrays. Functions state their sizes for one block: with `blocks` blocks, "K values of each"
+ *   means blocks * K values, block after block. Input arrays must not overlap output arrays. `blocks` and `count` may
+ *   be 0: an array without values may be null, and where nothing is to be done, the status is MORVIK_LINK_OK unless
+ *   another argument is wrong. Bits are bytes of 0 or 1, the first one sent first; only the lowest bit of a byte
+ * counts.
  *
  * @par Log-likelihood ratios
  *   ln(P(1) / P(0)), as float: positive where 1 is the likelier bit, as with the core's soft values. They should be
@@ -37,8 +38,8 @@
  *   soft value. Results are the same bits on every machine.
  *
  * @par Statuses
- *   Functions return a status. On every status but MORVIK_LINK_OK nothing has been written, except that memory may run
- *   out after some of the blocks. Nothing is printed, and no C++ exception gets out.
+ *   Functions return a status. Unless it is MORVIK_LINK_OK, nothing has been written; only if memory runs out may some
+ *   of the blocks be done. Nothing is printed, and no C++ exception escapes.
  *
  * @par Threads
  *   The library keeps no global state. One morvik_link_transport may not be used by two threads at once.
@@ -60,18 +61,18 @@
 extern "C" {
 #endif
 
-/** What a function returns. Checks are made in the order of these numbers, MORVIK_LINK_BUFFER_SIZE
- * last, and the first that fails is told. */
+/** What a function returns. Arguments are checked in the order of these numbers, MORVIK_LINK_BUFFER_SIZE last; the
+ * status names the first check that fails. */
 enum {
     MORVIK_LINK_OK = 0,
     MORVIK_LINK_NULL_POINTER = 1,         /**< an array or record is null, but for an array of no values           */
     MORVIK_LINK_TRANSPORT_BLOCK_SIZE = 2, /**< not 1 to 16777216                                                   */
-    MORVIK_LINK_BLOCK_SIZE = 3,           /**< K is none of the 188 block sizes                                    */
+    MORVIK_LINK_BLOCK_SIZE = 3,           /**< K is not one of the 188 block sizes                                 */
     MORVIK_LINK_FILLERS = 4,              /**< as many filler bits as K, or more                                   */
     MORVIK_LINK_BITS_PER_SYMBOL = 5,      /**< not 1, 2, 4, 6 or 8                                                 */
     MORVIK_LINK_LAYERS = 6,               /**< not 1 to 4                                                          */
-    MORVIK_LINK_CODED_BITS = 7,           /**< no multiple of the bits of a symbol on all layers, or fewer than one
-                                               symbol for each code block                                          */
+    MORVIK_LINK_CODED_BITS = 7,           /**< not a multiple of the bits of a symbol on all layers, or fewer than
+                                               one symbol for each code block                                      */
     MORVIK_LINK_BUFFER_SIZE = 8,          /**< the soft buffer is so small that no bit of a code block is in it    */
     MORVIK_LINK_REDUNDANCY_VERSION = 9,   /**< not 0 to 3                                                          */
     MORVIK_LINK_CODE_BLOCK = 10,          /**< there is no code block of this number                               */
@@ -89,10 +90,10 @@ MORVIK_LINK_API const char* morvik_link_status_text(int32_t status);
 /** @return the library's version, such as "1.0.0", which lives as long as the library is loaded */
 MORVIK_LINK_API const char* morvik_link_version(void);
 
-/* ---- Steps ---- */
+/* ---- Single stages ---- */
 
-/** The 24 parity bits of a transport block: TS 36.212, 5.1.1, gCRC24A. `parity` receives p_0 to p_23. Over bits with
- * their parity bits behind them, all 24 are 0.
+/** The 24 parity bits of a transport block: TS 36.212, 5.1.1, gCRC24A. `parity` receives p_0 to p_23. Over bits
+ * followed by their parity bits, all 24 are 0.
  *
  * @param bits      `count` bits
  * @param count     any number
@@ -173,7 +174,7 @@ MORVIK_LINK_API int32_t morvik_link_soft_buffer_size(uint32_t K,
  * @param blocks         number of blocks
  * @param ratios         `count` ratios of each
  * @param count          bits that were sent of each block (E)
- * @param buffers        soft buffers, as many values of each as morvik_link_soft_buffer_size tells
+ * @param buffers        soft buffers, as many values of each as morvik_link_soft_buffer_size returns
  */
 MORVIK_LINK_API int32_t morvik_link_rate_recover(uint32_t K,
                                                  uint32_t fillers,
@@ -184,20 +185,20 @@ MORVIK_LINK_API int32_t morvik_link_rate_recover(uint32_t K,
                                                  size_t count,
                                                  float* buffers);
 
-/** The same as a receiver does whose soft buffer has `width` bits, 2 to 16: in whole steps (of
- * morvik_link_soft_values_i16), each sum clipped to -2^(width - 1) ... 2^(width - 1) - 1. */
+/** The same for a soft buffer of `width` bits, 2 to 16: adds integers, such as morvik_link_soft_values_i16 gives, and
+ * clips each sum to -2^(width - 1) ... 2^(width - 1) - 1. */
 MORVIK_LINK_API int32_t morvik_link_rate_recover_i16(uint32_t K,
                                                      uint32_t fillers,
                                                      uint32_t buffer_size,
                                                      uint32_t version,
                                                      size_t blocks,
-                                                     const int16_t* steps,
+                                                     const int16_t* ratios,
                                                      size_t count,
                                                      uint32_t width,
                                                      int16_t* buffers);
 
-/** Puts values of soft buffers into the decoder's streams. Filler bits become `filler` in sys and par1, where they are
- * zeros that both sides know: -128 for the core. What was not sent and lies outside of the buffer becomes 0.
+/** Puts values of soft buffers into the decoder's streams. Filler bits, which both sides know to
+ * be 0, become `filler` in sys and par1: -128 for the core. Positions outside the buffer become 0.
  *
  * @param K              block size
  * @param fillers        filler bits at the start of each block (F)
@@ -230,12 +231,12 @@ MORVIK_LINK_API int32_t morvik_link_deinterleave_i8(uint32_t K,
                                                     int8_t* par1,
                                                     int8_t* par2);
 
-/** The core's input: ratios times scale, rounded with halves away from 0, clipped to -128 ... 127. Eight steps are 1.
+/** The core's input: ratios times scale, rounded with halves away from 0, clipped to -128 ... 127.
  *
  * @param ratios    the ratios
  * @param count     how many there are
- * @param scale     steps for a ratio of 1, above 0
- * @param values    receives a soft value of each
+ * @param scale     soft value for a ratio of 1, above 0
+ * @param values    receives a soft value for each
  */
 MORVIK_LINK_API int32_t morvik_link_soft_values(const float* ratios, size_t count, float scale, int8_t* values);
 
@@ -255,7 +256,7 @@ morvik_link_soft_values_i16(const float* ratios, size_t count, float scale, uint
  */
 MORVIK_LINK_API int32_t morvik_link_map(uint32_t bits_per_symbol, const uint8_t* bits, size_t count, float* symbols);
 
-/** Demappers: the nearest points alone, which is quick; or all points, exact but for the rounding of floats. */
+/** Demappers. MAX_LOG: the nearest points only, fast. EXACT: all points, exact but for the rounding of floats. */
 enum { MORVIK_LINK_MAX_LOG = 0, MORVIK_LINK_EXACT = 1 };
 
 /** The log-likelihood ratios of received symbols: gain * symbol + noise. They are finite: what is beyond the range of a
@@ -264,7 +265,7 @@ enum { MORVIK_LINK_MAX_LOG = 0, MORVIK_LINK_EXACT = 1 };
  *
  * @param bits_per_symbol    as above
  * @param demapper           MORVIK_LINK_MAX_LOG or MORVIK_LINK_EXACT
- * @param symbols            I and Q of each received symbol, finite, its phase already turned back; one number for BPSK
+ * @param symbols            I and Q of each received symbol, finite, its phase already corrected; one number for BPSK
  * @param gains              the channel's amplitude at each symbol, finite, at least 0; or null where all are 1
  * @param noise_variance     of I and Q together (N0), above 0; the one dimension of BPSK has half of it
  * @param count              number of symbols
@@ -293,10 +294,10 @@ typedef struct morvik_link_format {
 typedef struct morvik_link_transport morvik_link_transport;
 
 /** @param format    the format
- *  @param made      receives what the caller releases with morvik_link_transport_destroy */
+ *  @param made      receives the object, to be released with morvik_link_transport_destroy */
 MORVIK_LINK_API int32_t morvik_link_transport_create(const morvik_link_format* format, morvik_link_transport** made);
 
-/** Releases it; a null pointer is ignored. */
+/** Releases a transport. A null pointer is ignored. */
 MORVIK_LINK_API void morvik_link_transport_destroy(morvik_link_transport* transport);
 
 /** Where a code block lies. */
@@ -311,7 +312,7 @@ typedef struct morvik_link_places {
     uint32_t buffer_at;   /**< the first of them                                         */
 } morvik_link_places;
 
-/** @param transport    as made
+/** @param transport    from morvik_link_transport_create
  *  @param r            number of a code block, from 0 on
  *  @param places       receives its places */
 MORVIK_LINK_API int32_t morvik_link_transport_code_block(const morvik_link_transport* transport,
@@ -323,7 +324,7 @@ MORVIK_LINK_API uint32_t morvik_link_transport_buffer_size(const morvik_link_tra
 
 /** Encodes transport blocks: the coded bits of one transmission of each.
  *
- * @param transport    as made
+ * @param transport    from morvik_link_transport_create
  * @param version      redundancy version, 0 to 3
  * @param blocks       number of transport blocks
  * @param bits         transport_block_size bits of each
@@ -334,7 +335,7 @@ MORVIK_LINK_API int32_t morvik_link_transport_encode(
 
 /** Adds a transmission to soft buffers, which are zeros before the first one.
  *
- * @param transport    as made
+ * @param transport    from morvik_link_transport_create
  * @param version      redundancy version, 0 to 3
  * @param blocks       number of transport blocks
  * @param ratios       coded_bits ratios of each
@@ -347,18 +348,18 @@ MORVIK_LINK_API int32_t morvik_link_transport_recover(
 MORVIK_LINK_API int32_t morvik_link_transport_recover_i16(const morvik_link_transport* transport,
                                                           uint32_t version,
                                                           size_t blocks,
-                                                          const int16_t* steps,
+                                                          const int16_t* ratios,
                                                           uint32_t width,
                                                           int16_t* buffers);
 
 /** Code block r of each transport block as the core takes it: the soft buffer, scaled, rounded, clipped and put into
  * streams, filler bits as -128.
  *
- * @param transport    as made
+ * @param transport    from morvik_link_transport_create
  * @param r            number of the code block, from 0 on
  * @param blocks       number of transport blocks
  * @param buffers      their soft buffers
- * @param scale        steps for a ratio of 1, above 0
+ * @param scale        soft value for a ratio of 1, above 0
  * @param sys          receives K + 4 values of each transport block, K being the size of code block r
  * @param par1         likewise
  * @param par2         likewise
@@ -372,7 +373,7 @@ MORVIK_LINK_API int32_t morvik_link_transport_soft_values(const morvik_link_tran
                                                           int8_t* par1,
                                                           int8_t* par2);
 
-/** The same from soft buffers of whole steps, which are only clipped. */
+/** The same from soft buffers of integers, which are only clipped. */
 MORVIK_LINK_API int32_t morvik_link_transport_soft_values_i16(const morvik_link_transport* transport,
                                                               uint32_t r,
                                                               size_t blocks,
@@ -383,13 +384,13 @@ MORVIK_LINK_API int32_t morvik_link_transport_soft_values_i16(const morvik_link_
 
 /** Puts decisions on code block r of each transport block into the transport blocks.
  *
- * @param transport    as made
+ * @param transport    from morvik_link_transport_create
  * @param r            number of the code block, from 0 on
  * @param blocks       number of transport blocks
  * @param decisions    K decisions of each
- * @param bits         transport_block_size + 24 bits of each: those that code block r carries are written
- * @param fits         receives 1 for each code block whose CRC fits, or 0: its own CRC where there are several, else
- *                     the transport block's; or null
+ * @param bits         transport_block_size + 24 bits of each; only those that code block r carries are written
+ * @param fits         receives 1 for each code block whose CRC fits, otherwise 0: its own CRC where there are
+ *                     several, else the transport block's; or null
  */
 MORVIK_LINK_API int32_t morvik_link_transport_join(const morvik_link_transport* transport,
                                                    uint32_t r,
@@ -400,10 +401,10 @@ MORVIK_LINK_API int32_t morvik_link_transport_join(const morvik_link_transport* 
 
 /** Checks the CRC of transport blocks.
  *
- * @param transport    as made
+ * @param transport    from morvik_link_transport_create
  * @param blocks       number of transport blocks
  * @param bits         transport_block_size + 24 bits of each
- * @param fits         receives 1 for each transport block whose CRC fits, or 0
+ * @param fits         receives 1 for each transport block whose CRC fits, otherwise 0
  */
 MORVIK_LINK_API int32_t morvik_link_transport_check(const morvik_link_transport* transport,
                                                     size_t blocks,

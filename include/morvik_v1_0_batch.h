@@ -36,9 +36,9 @@ extern "C" {
 typedef struct veltra_ip_morvik_v1_0_batch_outputs {
     uint8_t* dout;       /**< in:  hard decisions, K for each block, each 0 or 1                            */
     size_t dout_alloc;   /**< in:  number of elements that `dout` has room for                              */
-    int16_t* ratios;     /**< in:  log-likelihood ratios of the last pass, K for each block, or null; 128
-                                 steps to one, positive for bit 1. They wrap like the hardware's 12-bit
-                                 metrics and are multiples of 16                                            */
+    int16_t* ratios;     /**< in:  log-likelihood ratios of the last pass, K for each block, or null; in
+                                 units of 1/128, multiples of 16, positive for bit 1. They wrap like the
+                                 hardware's 12-bit metrics                                                  */
     size_t ratios_alloc; /**< in:  number of elements that `ratios` has room for                            */
     uint32_t* tags;      /**< in:  block tags, masked to C_TAG_WIDTH bits, one for each block, or null      */
     size_t tags_alloc;   /**< in:  number of elements that `tags` has room for                              */

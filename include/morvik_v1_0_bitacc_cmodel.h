@@ -132,11 +132,10 @@ MORVIK_API void veltra_ip_morvik_v1_0_destroy_state(veltra_ip_morvik_v1_0_state*
  * @param tag           block tag, handed through to the outputs
  * @param outputs       record with `dout` and `dout_alloc` set by the caller
  *
- * Soft values: fixed-point numbers with 8 bits, 3 of them fraction, so 8 steps to one and -128 to
- * 127 in all. A positive value favours bit 1, a negative one bit 0; the magnitude says how much.
- * Only the low 24 bits of a value are looked at, read as a two's complement number, and that
- * number is clipped to -128 to 127. (16777216 is therefore read as 0, without a warning.) The arrays may
- * begin at any address.
+ * Soft values: fixed-point numbers with 8 bits, 3 of them fraction: -128 to 127, in eighths. A
+ * positive value favours bit 1, a negative one bit 0; the magnitude says how much. Only the low
+ * 24 bits of a value count, as a two's complement number, which is clipped to -128 to 127. (16777216 is therefore read
+ * as 0, without a warning.) The arrays may begin at any address.
  *
  * Tail: the last four positions carry the twelve trellis termination values in the standard's
  * order (clause 5.1.3.2.2), x and z being systematic and parity bits of the first encoder, x' and

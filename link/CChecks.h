@@ -1,4 +1,4 @@
-// CChecks: what the functions of include/morvik_link.h check, and how they tell of it.
+// CChecks: the argument checks of include/morvik_link.h, and their statuses.
 #ifndef MORVIK_LINK_CCHECKS_H
 #define MORVIK_LINK_CCHECKS_H
 
@@ -82,7 +82,7 @@ inline std::int32_t checkedTransportBlockSize(std::uint32_t size)
     return unless(size >= 1 && size <= mostTransportBits, MORVIK_LINK_TRANSPORT_BLOCK_SIZE);
 }
 
-/// Calls `work`, and tells of what it throws.
+/// Returns `checked` unless it is MORVIK_LINK_OK; otherwise calls `work` and turns exceptions into statuses.
 template <typename Work>
 std::int32_t guarded(std::int32_t checked, Work work)
 {
@@ -99,7 +99,7 @@ std::int32_t guarded(std::int32_t checked, Work work)
     }
 }
 
-/// A row of bits, packed.
+/// Packs `count` bytes, one bit each.
 inline std::vector<std::uint64_t> packed(const std::uint8_t* bits, std::size_t count)
 {
     std::vector<std::uint64_t> row(wordsOf(count));

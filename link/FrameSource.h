@@ -14,12 +14,12 @@
 
 namespace morvik::link {
 
-/// A number of consecutive frames.
+/// Consecutive frames.
 struct Frames {
     std::vector<std::uint8_t> sent;                   ///< K bits of each frame, each 0 or 1
     std::array<std::vector<std::int8_t>, 3> streams;  ///< systematic, parity 1, parity 2: K + 4 soft values of each
                                                       ///< frame, as include/morvik_v1_0_batch.h takes them
-    std::vector<std::uint32_t> clipped;               ///< how many soft values of each frame were clipped
+    std::vector<std::uint32_t> clipped;               ///< clipped soft values of each frame
 
     /// Makes room for `count` frames of K bits.
     void resize(unsigned count, unsigned K);
@@ -28,11 +28,11 @@ struct Frames {
 /// How soft values are made.
 enum class Noise {
     discrete,  ///< drawn from the exact distribution of the quantised values; the same on every machine
-    gaussian,  ///< a Gaussian number added, then quantised: slow, and as exact as the mathematical library of the
-               ///< machine; a check of the other
+    gaussian,  ///< Gaussian numbers added, then quantised: slow, and as exact as the machine's mathematical library;
+               ///< checks the other
 };
 
-/// Makes the frames of one point. A frame follows from seed, K, Eb/N0, scale and its number. Its information bits do
+/// Makes the frames of one point. A frame follows from seed, K, Eb/N0, scale and its number; its information bits do
 /// not depend on the scale.
 class FrameSource {
 public:
@@ -44,7 +44,7 @@ public:
 
     /// K                one of the 188 block sizes
     /// milliDecibels    Eb/N0 in thousandths of a decibel, from -262144 to 262143
-    /// scale            steps of the soft values for amplitude 1, above 0
+    /// scale            the soft value for amplitude 1, above 0
     ///
     /// Throws std::invalid_argument for other values. `form` is for tests.
     FrameSource(unsigned K,

@@ -1,6 +1,6 @@
 // ModulatedSource: plain code blocks as a decoder receives them over any modulation and channel.
 //
-// The three streams are sent one after the other; zeros fill up the last symbol.
+// The three streams are sent one after the other; zeros pad the last symbol.
 #ifndef MORVIK_LINK_MODULATEDSOURCE_H
 #define MORVIK_LINK_MODULATEDSOURCE_H
 
@@ -15,7 +15,7 @@ namespace morvik::link {
 class ModulatedSource {
 public:
     /// K        one of the 188 block sizes
-    /// scale    steps of the soft values for a log-likelihood ratio of 1, above 0
+    /// scale    the soft value for a log-likelihood ratio of 1, above 0
     ///
     /// Throws std::invalid_argument for other values. `form` is for tests.
     ModulatedSource(unsigned K,

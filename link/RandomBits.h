@@ -9,7 +9,7 @@
 
 namespace morvik::link {
 
-/// Draws `count` packed bits of a frame. Bits behind the last one become 0.
+/// Draws `count` packed bits of a frame. Clears the rest of the last word.
 void drawBits(RandomBatch& batch, const FrameRandom& random, std::size_t count, std::uint64_t* row);
 
 }  // namespace morvik::link

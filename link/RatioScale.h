@@ -6,9 +6,9 @@
 
 namespace morvik::link {
 
-/// Steps of a soft value for a log-likelihood ratio of 1. The ratios of high rates and of many levels need finer steps
-/// than those of low rates, but reach further; the best compromise is measured (docs/scale.md). Algorithm type 2 is
-/// right for one scale only, as DefaultScale.h tells.
+/// Returns the soft value for a log-likelihood ratio of 1. Small scales round weak bits away, large ones clip strong
+/// bits; the best compromise is measured (docs/scale.md). For algorithm type 2, only one scale is right
+/// (DefaultScale.h).
 ///
 /// codeRate    information bits for each bit sent so far, above 0
 double ratioScale(int algorithmType, Modulation modulation, double codeRate);

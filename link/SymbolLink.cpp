@@ -1,4 +1,4 @@
-// SymbolLink: from coded bits over mapper, channel and demapper to log-likelihood ratios.
+// SymbolLink: sends coded bits through mapper, channel and demapper; returns log-likelihood ratios.
 #include "SymbolLink.h"
 
 #include <algorithm>

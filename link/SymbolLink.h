@@ -1,4 +1,4 @@
-// SymbolLink: from coded bits over mapper, channel and demapper to log-likelihood ratios.
+// SymbolLink: sends coded bits through mapper, channel and demapper; returns log-likelihood ratios.
 #ifndef MORVIK_LINK_SYMBOLLINK_H
 #define MORVIK_LINK_SYMBOLLINK_H
 
@@ -20,7 +20,7 @@ struct SymbolFormat {
     int milliDecibels = 0;  ///< Es/N0 in thousandths of a decibel
 };
 
-/// What tells the random numbers of points with different formats apart. The receiver's choices do not.
+/// The part of the random key that distinguishes formats. It does not depend on the receiver's choices.
 std::uint64_t keyWordOf(const SymbolFormat& format);
 
 class SymbolLink {

@@ -1,5 +1,5 @@
-// TransportSource: transport blocks as a receiver's decoder gets them: random bits, coded after 3GPP TS 36.212, sent
-// over a channel in one or more transmissions, demapped, recovered, scaled and rounded.
+// TransportSource: transport blocks as a receiver's decoder gets them: random bits, encoded (3GPP TS 36.212), sent over
+// a channel in one or more transmissions, demapped, rate-recovered, scaled and rounded.
 #ifndef MORVIK_LINK_TRANSPORTSOURCE_H
 #define MORVIK_LINK_TRANSPORTSOURCE_H
 
@@ -23,7 +23,7 @@ struct TransportSetting {
     std::vector<unsigned> versions;             ///< the redundancy version of each transmission
     unsigned softBufferSize = unlimitedBuffer;  ///< N_IR
     unsigned softBufferBits = 0;                ///< width of the values that are added up, 2 to 16; 0: floats
-    std::vector<double> scales;                 ///< steps for a ratio of 1, in each transmission; above 0
+    std::vector<double> scales;                 ///< soft value for a ratio of 1, in each transmission
 };
 
 /// What is coded in a setting. Its modulation is sent on one layer.
@@ -45,7 +45,7 @@ struct CodeBlockBatch {
 /// its number; its bits and the noise of a transmission depend on nothing else.
 class TransportSource {
 public:
-    /// Throws std::invalid_argument for a setting that cannot be. `form` is for tests.
+    /// Throws std::invalid_argument for an impossible setting. `form` is for tests.
     TransportSource(const TransportSetting& setting,
                     std::uint64_t seed,
                     const SamplerForm& form = samplerForms().front());
@@ -55,17 +55,17 @@ public:
         return itsCode;
     }
 
-    /// Begins with frames first to first + count - 1: draws their bits and encodes them.
+    /// Draws and encodes the bits of frames first to first + count - 1.
     void begin(std::uint64_t first, unsigned count);
 
-    /// Sends transmission `transmission` of some of these frames, which have had all earlier ones, and makes the code
-    /// blocks of each anew, the smaller size first. Adds the clipped soft values of a frame to its entry in `clipped`.
+    /// Sends transmission `transmission` of some of these frames, to which all earlier ones have been sent, and remakes
+    /// their code blocks, the smaller size first. Adds each frame's clipped soft values to its entry in `clipped`.
     void transmit(const std::vector<unsigned>& frames,
                   unsigned transmission,
                   std::array<CodeBlockBatch, 2>& batches,
                   std::uint32_t* clipped);
 
-    /// The packed bits that code block r of a frame was made of, filler bits and CRC included.
+    /// The packed bits of code block r of a frame before encoding, with filler bits and CRC.
     void sentBlock(unsigned frame, unsigned r, std::uint64_t* bits) const
     {
         itsCode.frame(itsInformation.block(frame), r, bits);

@@ -15,7 +15,7 @@ namespace morvik::simulation {
 /// The three streams of blocks of K bits: K + 4 soft values of each.
 using Streams = std::array<std::vector<std::int8_t>, 3>;
 
-/// A decoder of one configuration. All functions throw std::runtime_error if it refuses.
+/// A decoder with one configuration. All functions throw std::runtime_error if it refuses.
 class Core {
 public:
     /// An empty instruction set leaves the choice to the decoder; all give the same bits.

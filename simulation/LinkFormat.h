@@ -24,11 +24,11 @@ struct McsIndex {
 /// The most transmissions of a transport block.
 constexpr std::size_t mostTransmissions = 16;
 
-/// Unless anything is set: plain code blocks over BPSK and white Gaussian noise.
+/// Defaults: plain code blocks over BPSK and white Gaussian noise.
 struct LinkFormat {
     unsigned transportBlockSize = 0;   // without its CRC (A); 0: plain code blocks
     unsigned codedBits = 0;            // of one transmission (G); 0 for plain code blocks
-    std::optional<McsIndex> mcs = {};  // that they follow from
+    std::optional<McsIndex> mcs = {};  // from which they follow
     link::Modulation modulation = link::Modulation::bpsk;
     link::Fading fading = link::Fading::none;
     link::Demapper demapper = link::Demapper::maxLog;

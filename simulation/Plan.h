@@ -24,7 +24,7 @@ struct Sweep {
     std::vector<ScaleOption> scaleOptions;
     std::vector<unsigned> iterations;
     std::vector<int> milliDecibels;          // along the axis; if empty, a range suited to the block and its format
-    std::vector<LinkFormat> formats = {{}};  // those of plain code blocks are combined with the block sizes
+    std::vector<LinkFormat> formats = {{}};  // plain code blocks are combined with the block sizes
     Axis axis = Axis::ebn0;
 };
 

@@ -11,7 +11,7 @@
 
 namespace morvik::simulation {
 
-/// The requested scale in thousandths: soft-value steps for amplitude 1 with plain code blocks over BPSK, otherwise for
+/// The requested scale in thousandths: the soft value for amplitude 1 with plain code blocks over BPSK, otherwise for
 /// a log-likelihood ratio of 1. Nothing selects the scale that suits the algorithm and the channel.
 using ScaleOption = std::optional<int>;
 
@@ -27,7 +27,7 @@ struct Point {
     unsigned numPu = 0;       // processing units: 2, 4 or 8
     unsigned algorithm = 0;   // C_ALGORITHM_TYPE: 0 to 2
     ScaleOption scaleOption;  // as requested
-    int milliScale = 0;       // as used: thousandths of a soft-value step
+    int milliScale = 0;       // as used, in thousandths
     unsigned iterations = 0;  // full iterations: 1 to 15
     int milliDecibels = 0;    // Eb/N0 in thousandths of a decibel
     LinkFormat link = {};
@@ -44,7 +44,7 @@ bool operator<(const Point& a, const Point& b);
 /// Whether the points are on one curve: they differ only in Eb/N0.
 bool onSameCurve(const Point& a, const Point& b);
 
-/// A size of what the point decodes.
+/// Sizes of what the point decodes.
 unsigned codeBlocksOf(const Point& point);        // of a block
 std::uint64_t countedBitsOf(const Point& point);  // that can be wrong in a block: with its CRCs, without filler bits
 std::uint64_t softValuesOf(const Point& point);   // that the decoder receives for a block and transmission
@@ -55,11 +55,11 @@ std::uint64_t symbolsOf(const LinkFormat& link, unsigned blockSize);
 /// Information bits of a symbol: the tail is counted as sent, CRCs are no information.
 double bitsPerSymbolOf(const LinkFormat& link, unsigned blockSize);
 
-/// The point's Es/N0 in thousandths of a decibel, whatever it is made of.
+/// The point's Es/N0 in thousandths of a decibel, of every kind of point.
 int milliEsn0Of(const Point& point);
 
-/// The scale that suits a transmission of a point whose blocks are not sent over BPSK and Gaussian noise as plain code
-/// blocks: soft-value steps for a log-likelihood ratio of 1.
+/// The scale that suits a transmission of a point that is not plain code blocks over BPSK and Gaussian noise: the soft
+/// value for a log-likelihood ratio of 1.
 double automaticScale(const Point& point, unsigned transmission);
 
 /// Whether files of results show how the point's blocks are sent.

@@ -10,7 +10,7 @@
 
 namespace morvik::simulation {
 
-/// A code block as the decoder got it last.
+/// A code block as the decoder last received it.
 struct ReceivedBlock {
     Streams streams;
     std::vector<std::uint8_t> sent;  // K bits
@@ -28,7 +28,7 @@ public:
     /// at least as many as the encoder and the decoder take at once.
     virtual std::uint32_t framesAtOnce() const = 0;
 
-    /// Simulates frames first to first + count - 1 and appends what comes of them.
+    /// Simulates frames first to first + count - 1 and appends their results.
     virtual void simulate(std::uint64_t first, std::uint32_t count, BatchResult& result) = 0;
 
     /// The code blocks of the first of the frames that were simulated last.

@@ -18,7 +18,7 @@ namespace morvik::simulation {
 struct ResultRow {
     std::size_t pointNumber = 0;
     Point point;
-    FrameSet frames;  // that were counted
+    FrameSet frames;  // counted
     ErrorCounts errors;
     std::uint64_t clipped = 0;
     double seconds = 0;
@@ -38,12 +38,12 @@ double bitErrorRate(const ResultRow& row);
 double blockErrorRate(const ResultRow& row);
 double clippedFraction(const ResultRow& row);
 
-/// What the blocks took. Plain code blocks are sent once, with all iterations and without a CRC.
+/// The cost of the blocks. Plain code blocks are sent once, with all iterations and without a CRC.
 Reception receptionOf(const ResultRow& row);
 double meanIterations(const ResultRow& row);     // of a code block, each time it is decoded
 double meanTransmissions(const ResultRow& row);  // of a block
 
-/// Information bits of right blocks for each symbol sent.
+/// Information bits of error-free blocks per symbol sent.
 double throughput(const ResultRow& row);
 
 /// The bounds of its rates.

@@ -8,7 +8,7 @@
 
 namespace morvik::simulation {
 
-/// What a transport block took, at one iteration count, and what is left of it; or the sums of several.
+/// The cost of a transport block at one iteration count, and its remaining errors; or the sums of several blocks.
 struct Reception {
     std::uint64_t codeBlockErrors = 0;  // code blocks with a wrong bit after the last transmission
     std::uint64_t undetected = 0;       // transport blocks with a wrong bit whose CRCs all fit

@@ -11,7 +11,7 @@
 
 namespace morvik::simulation {
 
-/// What is wrong in the decisions on a code block. Filler bits are known, whatever is decided.
+/// The errors in the decisions on a code block. Filler bits are known, so decisions on them do not count.
 struct BlockVerdict {
     std::uint32_t wrongBits = 0;
     bool fits = false;  // its CRC: that of the transport block, if it is alone

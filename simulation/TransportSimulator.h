@@ -24,7 +24,7 @@ public:
     std::vector<ReceivedBlock> receivedBlocks() const override;
 
 private:
-    /// What is known of a frame. All but the sums of `reception` is of its last transmission.
+    /// The state of a frame after its last transmission; `reception` sums all transmissions.
     struct Frame {
         std::uint32_t wrongBits = 0;
         Reception reception;
@@ -56,7 +56,7 @@ private:
     const Plan& itsPlan;
     const Point& itsPoint;
     Core& itsCore;
-    Core itsSmallCore;  // for the smaller size, as a core prepares for a size anew whenever that changes
+    Core itsSmallCore;  // for the smaller size: a core prepares anew whenever the size changes
     link::TransportSource itsSource;
     TransportCheck itsCheck;
     std::array<link::CodeBlockBatch, 2> itsBatches;

@@ -24,7 +24,7 @@ public:
     /// hardware: the core with 2 units and scaled extrinsic values
     static constexpr std::array<const char*, 4> names = {"reference", "input", "undivided", "hardware"};
 
-    /// `chosen` are some of the names; `scale` is in steps of a soft value for a ratio of 1.
+    /// `chosen` are some of the names; `scale` is the soft value for a ratio of 1.
     LossDecoders(const link::TransportBlockCode& code,
                  const std::vector<std::string>& chosen,
                  float scale,

@@ -50,10 +50,10 @@ const std::vector<unsigned char>& VariantDecoder::decode(const std::vector<doubl
                                                          double scale,
                                                          unsigned iterations)
 {
-    const double steps = scale * itsState->itsScale / 8;
+    const double unit = scale * itsState->itsScale / 8;
     itsSoft.clear();
     for (const double value : received) {
-        const double rounded = std::round(value * steps);
+        const double rounded = std::round(value * unit);
         const double lowest = itsBranch->itsMinQ;
         const double highest = itsBranch->itsMaxQ;
         itsSoft.push_back(itsState->place(static_cast<std::int32_t>(std::clamp(rounded, lowest, highest))));

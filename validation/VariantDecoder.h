@@ -12,7 +12,7 @@
 
 namespace morvik::validation {
 
-/// A decoder between the reference and the hardware. More than three fraction bits divide the step of the soft values.
+/// A decoder between the reference and the hardware. More than three fraction bits resolve more than eighths.
 struct Variant {
     const char* name;
     std::size_t predecessor;  ///< the variant that differs by one step
@@ -40,7 +40,7 @@ public:
     VariantDecoder(const Variant& variant, int algorithm);
 
     /// The decisions for a received block, a value of each stream position by position, in units of the transmitted
-    /// amplitude. `scale` is in steps of the hardware's soft values, eighths.
+    /// amplitude. `scale` is the hardware's soft value for amplitude 1.
     const std::vector<unsigned char>& decode(const std::vector<double>& received, double scale, unsigned iterations);
 
 private:

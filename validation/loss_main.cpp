@@ -86,7 +86,7 @@ void addOptions(CLI::App& app, Options& options)
     app.add_option("--transport-block-size", options.chain.bits, "A, of one code block")->required();
     app.add_option("--coded-bits", options.chain.codedBits, "G")->required();
     app.add_option("--iterations", options.iterations, "Turbo iterations, 1 to 15")->check(CLI::Range(1, 15));
-    app.add_option("--scale", options.scale, "Steps of a soft value for a ratio of 1; by default those of `morvik ber`")
+    app.add_option("--scale", options.scale, "Soft value for a ratio of 1; by default that of `morvik ber`")
         ->check(CLI::PositiveNumber);
     app.add_option("--esn0-millidb", options.milliDecibels, "Es/N0 in thousandths of a decibel")
         ->delimiter(',')

@@ -204,7 +204,7 @@ void addSweepOptions(CLI::App& command, simulation::Sweep& sweep)
                   "--scale",
                   sweep.scaleOptions,
                   appendScale,
-                  "Steps of the soft values for amplitude 1 of plain BPSK, otherwise for a log-likelihood ratio of 1; "
+                  "Soft value for amplitude 1 of plain BPSK, otherwise for a log-likelihood ratio of 1; "
                   "auto: what suits the algorithm and the channel")
         ->check(offer({"auto"}))
         ->type_name("X[,X...]")

@@ -196,7 +196,7 @@ void addLinkOptions(CLI::App& command, LinkOptions& options)
                options.softBufferBits,
                2,
                16,
-               "Add up received values in steps of this many bits, saturating; by default in full width");
+               "Add up received values as integers of this many bits, saturating; by default in full width");
     addInteger(command,
                "--soft-buffer-size",
                options.softBufferSize,

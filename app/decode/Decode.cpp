@@ -236,7 +236,7 @@ void addTransportDecodeOptions(CLI::App& command, TransportDecodeOptions& option
         .add_option_function<std::string>(
             "--scale",
             [&options](const std::string& text) { options.scale = readScale(text); },
-            "Steps of the core for a value of 1: 1 for soft values, more for log-likelihood ratios")
+            "Soft value for an input of 1: 1 for soft values, more for log-likelihood ratios")
         ->type_name("S")
         ->default_str("1")
         ->needs(size);

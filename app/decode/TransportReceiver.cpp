@@ -28,7 +28,7 @@ void TransportReceiver::clear()
     if (itsInput.softBufferBits == 0) {
         itsRatios.assign(itsCode.softSize(), 0);
     } else {
-        itsSteps.assign(itsCode.softSize(), 0);
+        itsSums.assign(itsCode.softSize(), 0);
     }
     itsFits = false;
 }
@@ -59,7 +59,7 @@ void TransportReceiver::recover(const std::vector<float>& values, unsigned versi
     }
     itsReceived.resize(values.size());
     link::softValues(values.data(), values.size(), itsInput.scale, itsInput.softBufferBits, itsReceived.data());
-    itsCode.recover(itsReceived.data(), version, itsInput.softBufferBits, itsSteps.data());
+    itsCode.recover(itsReceived.data(), version, itsInput.softBufferBits, itsSums.data());
 }
 
 /// Code block r as the core takes it.
@@ -70,7 +70,7 @@ const SoftBlock& TransportReceiver::softBlock(unsigned r)
     if (itsInput.softBufferBits == 0) {
         link::softValues(&itsRatios[at], itsValues.size(), itsInput.scale, itsValues.data());
     } else {
-        link::softValues(&itsSteps[at], itsValues.size(), itsValues.data());
+        link::softValues(&itsSums[at], itsValues.size(), itsValues.data());
     }
     const std::size_t length = itsCode.blocks().size(r) + rules::tailPositions;
     std::array<std::vector<std::int8_t>, 3> streams;

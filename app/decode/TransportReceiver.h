@@ -16,7 +16,7 @@ class TransportReceiver {
 public:
     /// How received values become those of the core.
     struct Input {
-        float scale;              ///< steps of the core for a value of 1
+        float scale;              ///< soft value for an input of 1
         unsigned softBufferBits;  ///< width of the soft buffer, 2 to 16; 0: sums are floats, scaled at the end
     };
 
@@ -60,8 +60,8 @@ private:
     Input itsInput;
     std::uint32_t itsIterations;
     Decoder itsDecoder;
-    std::vector<float> itsRatios;        // the soft buffer in full width,
-    std::vector<std::int16_t> itsSteps;  // or in steps
+    std::vector<float> itsRatios;       // the soft buffer in full width,
+    std::vector<std::int16_t> itsSums;  // or of softBufferBits
     std::vector<std::int16_t> itsReceived;
     std::vector<std::int8_t> itsValues;
     SoftBlock itsBlock;

@@ -6,11 +6,11 @@
 %
 % sys, par1, par2   soft values of the systematic and of the two parity streams (d(0), d(1), d(2) of 3GPP TS 36.212):
 %                   matrices of K + 4 rows, one block per column, its tail in the last four rows. A single block may
-%                   also be three rows; then bits and ratios are rows, too. A positive value favours bit 1, with 8 steps
-%                   per unit. Values are clipped to -128 ... 127. int8, int16 and int32 are decoded directly; values of
+%                   also be three rows; then bits and ratios are rows, too. A positive value favours bit 1. Values
+%                   are in eighths, clipped to -128 ... 127. int8, int16 and int32 are decoded directly; values of
 %                   other classes must be integers. Unsigned classes are refused.
 % bits              K decisions in each column, logical
-% ratios            log-likelihood ratios of the decisions, int16, 128 steps per unit
+% ratios            log-likelihood ratios of the decisions, int16, in units of 1/128
 % tags              block tags, truncated to tag_width bits, a row of uint32
 %
 % Options and their defaults:

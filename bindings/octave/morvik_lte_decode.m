@@ -3,7 +3,7 @@
 %   [bits, fits, code_blocks_fit] = morvik_lte_decode(buffers, transport_block_size, coded_bits, modulation, ...
 %                                                     option, value, ...)
 %
-% buffers                 as from morvik_lte_recover, a transport block in each column. Those of whole steps, int16, are
+% buffers                 as from morvik_lte_recover, a transport block in each column. Those of integers, int16, are
 %                         only clipped
 % transport_block_size    bits of a transport block (A)
 % coded_bits              bits of one transmission (G)
@@ -13,7 +13,7 @@
 % code_blocks_fit         whether the CRC of each code block fits: logical, a row for each code block
 %
 % Options:
-%   'scale'    steps of a soft value for a ratio of 1; [] is that of morvik_lte_scale (default)
+%   'scale'    soft value for a ratio of 1; [] is that of morvik_lte_scale (default)
 %   'num_pu', 'algorithm', 'iterations'    as for morvik_decode
 %   'layers', 'soft_buffer_size'           as for morvik_lte_encode
 %

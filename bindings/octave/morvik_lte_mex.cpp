@@ -4,7 +4,7 @@
 //     [status, text, ...] = morvik_lte_mex(command, ...)
 //
 // A block is a column. The callers have checked classes and sizes: bits are logical, ratios, symbols, soft buffers and
-// gains single, whole steps and their soft buffers int16, all numbers whole and within 32 bits where they count
+// gains single, integers and their soft buffers int16, all numbers whole and within 32 bits where they count
 // something. They also raise errors, from the status of the C interface: an interpreter's functions for it would leave
 // without destroying anything.
 #include <mex.h>
@@ -21,10 +21,11 @@
 #include "link/RatioScale.h"
 #include "link/SymbolLink.h"
 #include "morvik_link.h"
+#include "rules/Tail.h"
 
 namespace {
 
-constexpr std::size_t tailPositions = 4;
+using morvik::rules::tailPositions;
 constexpr std::size_t parityBits = 24;
 constexpr std::uint32_t coreWidth = 8;
 
@@ -63,7 +64,7 @@ mxArray* numericMatrix(std::size_t rows, std::size_t columns, mxClassID type)
     return mxCreateNumericMatrix(static_cast<mwSize>(rows), static_cast<mwSize>(columns), type, mxREAL);
 }
 
-/// Whether these are whole steps, not ratios.
+/// Whether these are integers, not floats.
 bool areSteps(const mxArray* values)
 {
     return mxGetClassID(values) == mxINT16_CLASS;

@@ -2,7 +2,7 @@
 %
 %   buffers = morvik_lte_rate_recover(ratios, K, option, value, ...)
 %
-% ratios     log-likelihood ratios ln(P(1) / P(0)), a block in each column; with the option width, whole steps of class
+% ratios     log-likelihood ratios ln(P(1) / P(0)), a block in each column; with the option width, integers of class
 %            int8 or int16, as morvik_lte_soft_values gives them
 % K          block size
 % buffers    soft buffers: the circular buffer without its dummy and filler bits, single, or int16 with a width

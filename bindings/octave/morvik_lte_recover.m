@@ -3,7 +3,7 @@
 %   buffers = morvik_lte_recover(ratios, transport_block_size, modulation, option, value, ...)
 %
 % ratios                  ln(P(1) / P(0)) of the coded bits, as from morvik_lte_demap, a transport block in each column;
-%                         with the option width, whole steps of class int8 or int16, as from morvik_lte_soft_values
+%                         with the option width, integers of class int8 or int16, as from morvik_lte_soft_values
 % transport_block_size    bits of a transport block (A)
 % modulation              as for morvik_lte_encode
 % buffers                 soft buffers, single, or int16 with a width

@@ -6,7 +6,7 @@
 % modulation    as for morvik_lte_map
 % code_rate     bits of a transport block for each coded bit that was sent, in all transmissions: above 0
 % algorithm     of the core: 'max-log', 'scaled' (default) or 'table'
-% scale         steps of a soft value for a ratio of 1
+% scale         soft value for a ratio of 1
 %
 % Errors:   morvik:badCall, morvik:badValue, morvik:badOption
 %

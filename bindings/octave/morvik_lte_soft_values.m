@@ -4,7 +4,7 @@
 %   values = morvik_lte_soft_values(ratios, scale, width)
 %
 % ratios    ln(P(1) / P(0)), finite
-% scale     steps for a ratio of 1, such as morvik_lte_scale tells
+% scale     soft value for a ratio of 1, such as morvik_lte_scale tells
 % width     bits of a value, 2 to 16: 8 for the core (default), others for soft buffers
 % values    scaled, rounded with halves away from 0, clipped to -2^(width - 1) ... 2^(width - 1) - 1: int8 where width
 %           is 8, else int16

@@ -2,7 +2,7 @@
 %
 %   streams = morvik_lte_streams(buffers, transport_block_size, coded_bits, modulation, option, value, ...)
 %
-% buffers                 as from morvik_lte_recover, a transport block in each column. Those of whole steps, int16, are
+% buffers                 as from morvik_lte_recover, a transport block in each column. Those of integers, int16, are
 %                         only clipped
 % transport_block_size    bits of a transport block (A)
 % coded_bits              bits of one transmission (G)
@@ -10,7 +10,7 @@
 % streams                 a cell for each code block, with sys, par1 and par2 in its three columns: int8 of K + 4 rows
 %
 % Options:
-%   'scale'        steps of a soft value for a ratio of 1; [] is that of morvik_lte_scale (default)
+%   'scale'        soft value for a ratio of 1; [] is that of morvik_lte_scale (default)
 %   'algorithm'    of the core, for which the scale is chosen (default 'scaled')
 %   'layers', 'soft_buffer_size'    as for morvik_lte_encode
 %

@@ -18,7 +18,7 @@ struct Held {
 
 constexpr Held held(int value)
 {
-    return {static_cast<std::int16_t>(rules::clip(value, -32768, 32752))};  // -2048 and 2047 steps
+    return {static_cast<std::int16_t>(rules::clip(value, -32768, 32752))};  // -2048 and 2047 eighths
 }
 
 constexpr Held addWrap(Held a, Held b)

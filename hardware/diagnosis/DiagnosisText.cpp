@@ -86,7 +86,7 @@ std::string appearanceText(const Diagnosis& diagnosis)
     std::string text = "Wrong signs: rsc1_sys " + percent(appearance.streams[0]) + ", rsc1_par " +
                        percent(appearance.streams[1]) + ", rsc2_par " + percent(appearance.streams[2]) + ", tail " +
                        percent(appearance.tail) + ".\nAmplitude: " + number(appearance.amplitude, 1) +
-                       " steps of the file; 8 suit algorithm types 0 and 1 (docs/scale.md).";
+                       " in the file; 8 suits algorithm types 0 and 1 (docs/scale.md).";
     const bool isFarOff = std::abs(std::log2(std::max(appearance.amplitude, 1e-3) / 8)) > 1.5;
     text += isFarOff ? " This is far from it and costs error rate." : "";
     if (diagnosis.clipped > 0) {

@@ -33,7 +33,7 @@ private:
     std::uint32_t itsIterations;
 };
 
-/// How many of `blocks` simulated blocks of K bits fail. `scale` is the amplitude in soft-value steps.
+/// How many of `blocks` simulated blocks of K bits fail. `scale` is the soft value for amplitude 1.
 std::uint32_t simulatedFailures(
     const DecoderOptions& options, unsigned K, double ebn0, double scale, std::uint32_t blocks);
 

@@ -12,7 +12,7 @@
 
 namespace morvik::link {
 
-/// The noise's standard deviation for an Eb/N0 that includes the tail's energy: the rate is K / (3 K + 12).
+/// The noise's standard deviation for amplitude 1. Eb/N0 includes the tail's energy: the rate is K / (3 K + 12).
 long double noiseDeviation(unsigned K, int milliDecibels);
 
 /// The distribution of the rounded value r of a bit sent as 1. That of a 0 is the distribution of -r.

@@ -1,4 +1,4 @@
-// DefaultScale: the default scale, in steps of a soft value for amplitude 1.
+// DefaultScale: the default scale: the soft value for amplitude 1.
 #include "DefaultScale.h"
 
 #include "Channel.h"

@@ -25,26 +25,26 @@ constexpr std::array<Fading, 3> fadings = {Fading::none, Fading::symbol, Fading:
 std::string_view nameOf(Fading fading);
 std::optional<Fading> fadingOf(std::string_view name);
 
-/// A channel for symbols of mean energy 1 in one dimension or two. The receiver knows the gains, and has turned the
-/// phase back; so a gain is the amplitude of a complex Gaussian number of mean energy 1.
+/// A channel for symbols of mean energy 1 in one or two dimensions. The receiver knows the gains and has corrected the
+/// phase, so a gain is the amplitude of a complex Gaussian number of mean energy 1.
 class FadingChannel {
 public:
-    /// `milliDecibels` is the Es/N0 in thousandths of a decibel, up to mostMilliDecibels from 0. Throws
-    /// std::invalid_argument for others. `form` is for tests.
+    /// `milliDecibels` is the Es/N0 in thousandths of a decibel, -mostMilliDecibels to mostMilliDecibels. Throws
+    /// std::invalid_argument otherwise. `form` is for tests.
     FadingChannel(Fading fading,
                   unsigned dimensions,
                   int milliDecibels,
                   const RandomKey& key,
                   const SamplerForm& form = samplerForms().front());
 
-    /// N0: the noise's variance in both dimensions together, or twice that in the only one.
+    /// N0: the noise's variance in both dimensions together, or twice that in a single one.
     float noiseVariance() const
     {
         return itsNoiseVariance;
     }
 
-    /// Turns `count` sent symbols into received ones, the first of which is symbol `first` of transmission
-    /// `transmission` of a frame; `first` is a multiple of 64. Sets the gain of each, unless all are 1.
+    /// Turns `count` sent symbols into received ones, from symbol `first` of a transmission on; `first` is a multiple
+    /// of 64. Sets their gains unless all are 1.
     void pass(std::uint64_t frame,
               unsigned transmission,
               std::uint32_t first,

@@ -1,7 +1,7 @@
 // NoiseSampler: Gaussian noise in integers, the same on every machine.
 //
 // A number is 256 d + u + v - 255: d is drawn from a discrete Gaussian distribution, exactly; u and v are uniform
-// bytes, whose sum spreads each step of d as a triangle. The result has a Gaussian's moments but for 1e-7 of the
+// bytes, whose sum spreads each value of d as a triangle. The result has a Gaussian's moments but for 1e-7 of the
 // fourth, and ends at 7 standard deviations, which one number in 4e11 would exceed.
 #ifndef MORVIK_LINK_CHANNEL_NOISESAMPLER_H
 #define MORVIK_LINK_CHANNEL_NOISESAMPLER_H

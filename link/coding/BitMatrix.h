@@ -1,4 +1,4 @@
-// BitMatrix: transposes 64 by 64 bits, between words of one block and words that hold one position of 64 blocks.
+// BitMatrix: transposes 64 x 64 bits, between words of one block and words that hold one position of 64 blocks.
 #ifndef MORVIK_LINK_CODING_BITMATRIX_H
 #define MORVIK_LINK_CODING_BITMATRIX_H
 
@@ -26,7 +26,7 @@ void transposeStep(const BitMatrix& from, BitMatrix& to)
     }
 }
 
-/// Transposes.
+/// Transposes in place.
 inline void transpose(BitMatrix& matrix)
 {
     BitMatrix other;

@@ -28,7 +28,7 @@ struct CodeBlocks {
         return r == 0 ? fillers : 0;
     }
 
-    /// Bits of each code block's own CRC: none if it is alone.
+    /// Bits of each code block's own CRC; a single code block has none.
     unsigned ownCrcBits() const
     {
         return count > 1 ? crcBits : 0;

@@ -36,7 +36,7 @@ constexpr std::uint64_t lowBits(std::size_t count)
     return count == 0 ? 0 : ~std::uint64_t{0} >> (64 - count);
 }
 
-/// Bits `first` to `first` + `count` - 1, 1 to 64 of them, as a word. Reads no word without one of them.
+/// Bits `first` to `first` + `count` - 1 as a word, 1 to 64 of them. Reads only words that hold one of them.
 inline std::uint64_t bitsAt(const std::uint64_t* row, std::size_t first, std::size_t count)
 {
     const std::size_t shift = first % 64;
@@ -47,13 +47,13 @@ inline std::uint64_t bitsAt(const std::uint64_t* row, std::size_t first, std::si
     return bits & lowBits(count);
 }
 
-/// Copies `count` bits to position `to` of a row, and leaves the bits around them.
+/// Copies `count` bits to position `to` of a row; the other bits of the row stay.
 void copyBits(const std::uint64_t* from, std::size_t first, std::size_t count, std::uint64_t* row, std::size_t to);
 
-/// Packs `count` bytes, a bit 1 where the lowest bit is set. Bits behind the last one become 0.
+/// Packs the lowest bits of `count` bytes. Clears the rest of the last word.
 void packBits(const std::uint8_t* bytes, std::size_t count, std::uint64_t* row);
 
-/// Spreads `count` bits over bytes of 0 and 1.
+/// Unpacks `count` bits into bytes of 0 or 1.
 void unpackBits(const std::uint64_t* row, std::size_t count, std::uint8_t* bytes);
 
 }  // namespace morvik::link

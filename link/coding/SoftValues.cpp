@@ -1,4 +1,4 @@
-// SoftValues: from log-likelihood ratios to the core's input: scaled, rounded, clipped.
+// SoftValues: turns log-likelihood ratios into the core's input: scaled, rounded, clipped.
 #include "SoftValues.h"
 
 #include <algorithm>

@@ -1,4 +1,4 @@
-// SoftValues: from log-likelihood ratios to the core's input: scaled, rounded, clipped.
+// SoftValues: turns log-likelihood ratios into the core's input: scaled, rounded, clipped.
 #ifndef MORVIK_LINK_CODING_SOFTVALUES_H
 #define MORVIK_LINK_CODING_SOFTVALUES_H
 

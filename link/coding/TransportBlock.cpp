@@ -1,4 +1,4 @@
-// TransportBlock: from transport blocks to the coded bits of a transmission, and from received values to code blocks:
+// TransportBlock: turns transport blocks into the coded bits of a transmission, and received values into code blocks:
 // 3GPP TS 36.212, clauses 5.1.1 to 5.1.5.
 #include "TransportBlock.h"
 

@@ -1,4 +1,4 @@
-// TransportBlock: from transport blocks to the coded bits of a transmission, and from received values to code blocks:
+// TransportBlock: turns transport blocks into the coded bits of a transmission, and received values into code blocks:
 // 3GPP TS 36.212, clauses 5.1.1 to 5.1.5.
 #ifndef MORVIK_LINK_CODING_TRANSPORTBLOCK_H
 #define MORVIK_LINK_CODING_TRANSPORTBLOCK_H
@@ -28,7 +28,7 @@ struct TransportFormat {
 /// The code of one format. Rows of a batch are transport blocks; each has C code blocks.
 class TransportBlockCode {
 public:
-    /// Throws std::invalid_argument for a format that cannot be sent, with what would fit.
+    /// Throws std::invalid_argument for a format that cannot be sent; the text says what would fit.
     explicit TransportBlockCode(const TransportFormat& format);
 
     const TransportFormat& format() const
@@ -59,8 +59,7 @@ public:
         return itsPayloadOffsets[r];
     }
 
-    /// Words of the packed circular buffers of one transport block; they stand one after the other, each from a new
-    /// word on.
+    /// Words of the packed circular buffers of one transport block. Each buffer starts at a new word.
     std::size_t bufferWords() const
     {
         return itsWordOffsets.back();
@@ -72,11 +71,11 @@ public:
     /// The coded bits of one transmission of each transport block.
     void select(const PackedBlocks& buffers, unsigned count, unsigned version, PackedBlocks& coded) const;
 
-    /// The same of one transport block. `coded` is all zeros before.
+    /// The same for one transport block. `coded` must be all zeros.
     void select(const std::uint64_t* buffers, unsigned version, std::uint64_t* coded) const;
 
-    /// Code block r of a packed transport block before the encoder: filler bits, its part of the transport block and of
-    /// its CRC, its own CRC. `block` is all zeros before.
+    /// Code block r of a packed transport block as it enters the encoder: filler bits, its part of the transport block
+    /// and of its CRC, its own CRC. `block` must be all zeros.
     void frame(const std::uint64_t* row, unsigned r, std::uint64_t* block) const;
 
     /// Values of a soft buffer; that of code block r starts at softOffset(r).
@@ -92,7 +91,7 @@ public:
     /// Adds one transmission of codedBits values to a soft buffer of softSize() values.
     void recover(const float* received, unsigned version, float* buffer) const;
 
-    /// The same in whole steps, each sum clipped to `width` bits, 2 to 16.
+    /// The same in integers, each sum clipped to `width` bits, 2 to 16.
     void recover(const std::int16_t* received, unsigned version, unsigned width, std::int16_t* buffer) const;
 
     /// Whether a transmission sends no bit of the circular buffers twice.
@@ -126,8 +125,8 @@ private:
     std::vector<std::size_t> itsSoftOffsets;
     std::vector<std::size_t> itsPayloadOffsets;
     std::map<unsigned, TurboEncoder> itsEncoders;  ///< by block size
-    std::vector<Place> itsPlaces;                  ///< code blocks that are encoded at once,
-    PackedBlocks itsFramed;                        ///< and their bits
+    std::vector<Place> itsPlaces;                  ///< of the code blocks encoded at once
+    PackedBlocks itsFramed;                        ///< their bits
 };
 
 }  // namespace morvik::link

@@ -13,7 +13,7 @@ namespace morvik::link {
 
 class TurboEncoder {
 public:
-    /// The most blocks that one call encodes. A single block takes about as long.
+    /// The most blocks of one call. Encoding a single block takes about as long.
     static constexpr unsigned blocksAtOnce = 64;
 
     /// The three streams: systematic, first and second parity. Each block has K + 4 bits, its twelve tail bits last, in
@@ -29,12 +29,12 @@ public:
         return itsWords;
     }
 
-    /// Encodes `count` blocks, up to blocksAtOnce. Bits of `information` behind a block's K have to be 0, as are those
-    /// of the streams behind K + 4.
+    /// Encodes `count` blocks, up to blocksAtOnce. The bits of `information` after a block's K must be 0; those of the
+    /// streams after K + 4 become 0.
     void encode(const PackedBlocks& information, unsigned count, Streams& streams);
 
-    /// The same in another order: the bits of block b become a packed row, rows[b]. Bit i of a row is bit order[i] of
-    /// the block, counted through its three streams of K + 4 bits.
+    /// The same in another order: block b becomes the packed row rows[b], whose bit i is bit order[i] of the block,
+    /// counted through its three streams of K + 4 bits.
     void encode(const PackedBlocks& information,
                 unsigned count,
                 const std::vector<std::uint16_t>& order,

@@ -1,4 +1,4 @@
-// Demapper: from received symbols to log-likelihood ratios of their bits.
+// Demapper: computes the log-likelihood ratios of the bits of received symbols.
 #include "Demapper.h"
 
 #include <algorithm>

@@ -1,6 +1,6 @@
-// Demapper: from received symbols to log-likelihood ratios of their bits.
+// Demapper: computes the log-likelihood ratios of the bits of received symbols.
 //
-// Results are the same on every machine: only additions, multiplications and divisions of IEEE floats reach them.
+// Results are the same on every machine: they come from additions, multiplications and divisions of IEEE floats only.
 #ifndef MORVIK_LINK_MODULATION_DEMAPPER_H
 #define MORVIK_LINK_MODULATION_DEMAPPER_H
 
@@ -28,7 +28,7 @@ std::optional<Demapper> demapperOf(std::string_view name);
 ///
 /// symbols          as mapSymbols makes them, times gain, plus noise
 /// gains            one of each symbol, at least 0; or null: all are 1
-/// noiseVariance    of I and Q together, N0, above 0; BPSK receives the half of it in its one dimension
+/// noiseVariance    of I and Q together, N0, above 0; the single dimension of BPSK has half of it
 void demapSymbols(Modulation modulation,
                   Demapper demapper,
                   const float* symbols,

@@ -1,4 +1,4 @@
-// Mapper: from coded bits to symbols: 3GPP TS 36.211, clauses 7.1.2 to 7.1.5; BPSK sends +1 for a 1.
+// Mapper: maps coded bits to symbols: 3GPP TS 36.211, clauses 7.1.2 to 7.1.5; BPSK sends +1 for a 1.
 #ifndef MORVIK_LINK_MODULATION_MAPPER_H
 #define MORVIK_LINK_MODULATION_MAPPER_H
 

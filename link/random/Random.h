@@ -31,7 +31,7 @@ inline RandomBlock randomBlock(const RandomKey& key, std::uint64_t counterLow, s
 
 RandomKey randomKey(std::uint64_t seed);
 
-/// A key for what the words name, different for each seed.
+/// A key that depends on another key and two words.
 RandomKey derivedKey(const RandomKey& key, std::uint64_t low, std::uint64_t high);
 
 /// The random numbers of a frame. Word 0 of the counter is the index, the others name the frame and its point.
@@ -40,7 +40,7 @@ public:
     /// `K` below 8192; `milliDecibels`, the Eb/N0 in thousandths of a decibel, from -262144 to 262143.
     FrameRandom(const RandomKey& key, unsigned K, int milliDecibels, std::uint64_t frame);
 
-    /// Of a key that names the point. `part` tells the transmissions of a frame apart.
+    /// With a key that names the point. `part` distinguishes the transmissions of a frame.
     FrameRandom(const RandomKey& key, std::uint32_t part, std::uint64_t frame);
 
     RandomBlock block(std::uint32_t index) const

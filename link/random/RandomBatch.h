@@ -56,7 +56,7 @@ public:
         return itsHigh[i];
     }
 
-    /// All of them, of each counter words 0 and 1, or words 2 and 3.
+    /// The same for all counters.
     const std::uint64_t* lows() const
     {
         return itsLow.data();

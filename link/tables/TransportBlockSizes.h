@@ -21,11 +21,11 @@ unsigned countOf(McsTable table);
 /// Throws std::invalid_argument if the table has no such index.
 Mcs mcsOf(McsTable table, unsigned index);
 
-/// The pairs of resource blocks that a transport block can take.
+/// The most pairs of resource blocks that a transport block can take.
 constexpr unsigned mostResourceBlocks = 110;
 
 /// Bits of a transport block on one layer (table 7.1.7.2.1-1), without its CRC. Throws std::invalid_argument for a size
-/// index above 33 or pairs of resource blocks that are none of 1 to 110.
+/// index above 33, or for 0 or more than 110 pairs of resource blocks.
 unsigned transportBlockSize(unsigned sizeIndex, unsigned resourceBlocks);
 
 }  // namespace morvik::link

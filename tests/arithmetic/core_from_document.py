@@ -2,14 +2,14 @@
 
 A column of metrics has the shape (8 states, blocks, segments), branch metrics (4, steps of a segment, blocks,
 segments). The steps of a recursion follow each other, as in the hardware; blocks and segments are computed side by
-side. All values are aligned words: one step is 16.
+side. All values are aligned words: an eighth is 16.
 """
 
 import numpy as np
 
 STATES = np.arange(8)
 FORMAT_MIN, FORMAT_MAX = -2048, 2032  # soft values and branch metrics, rules 4 and 5
-STEP_MASK = ~15
+EIGHTH_MASK = ~15
 BORDER_MASK = np.int16(~127)
 
 
@@ -244,13 +244,13 @@ def divided(values, divisor):
 
 
 def intrinsic_values(a_priori, systematic):
-    return divided((divided(a_priori, 2) & STEP_MASK) + systematic, 2)
+    return divided((divided(a_priori, 2) & EIGHTH_MASK) + systematic, 2)
 
 
 def extrinsic_values(ratios, intrinsic, scale):
     x = np.trunc((ratios - 4 * intrinsic) * scale).astype(int)
     x = np.clip(x, FORMAT_MIN, FORMAT_MAX)
-    return x if scale == 1 else x & STEP_MASK
+    return x if scale == 1 else x & EIGHTH_MASK
 
 
 # Rules 15 and 16.
@@ -263,7 +263,7 @@ def interleaver(block_size, f1, f2):
 
 
 def decode(soft_values, permutation, units, algorithm, iterations, tail_clipped=False):
-    """Ratios, in steps, of blocks of one size: soft_values[block, position, stream]. 0 or more decides for 1.
+    """Ratios, in eighths, of blocks of one size: soft_values[block, position, stream]. 0 or more decides for 1.
 
     tail_clipped makes the mistake against which rule 12 warns."""
     values = aligned_inputs(soft_values)

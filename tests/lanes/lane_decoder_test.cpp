@@ -26,7 +26,8 @@ namespace {
 using morvik::lanes::Algorithm;
 using morvik::rules::Cut;
 
-/// 6 steps up to a magnitude of 63, 4 up to 127, and so on (rule 9), by quarters of a magnitude in steps.
+/// 6 eighths up to a magnitude of 63, 4 up to 127, and so on (rule 9), indexed by a quarter of the magnitude in
+/// eighths.
 constexpr morvik::lanes::CorrectionTable corrections = {6, 4, 3, 2, 1, 1};
 
 /// The component path: one decoder with its formats, interleaver and engine.

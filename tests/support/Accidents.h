@@ -16,7 +16,7 @@ struct SentFrame {
     std::vector<int> bits;
 };
 
-/// Frames of random bits, amplitude 8 steps, noise of the given deviation in steps.
+/// Frames of random bits, amplitude 8, noise of the given standard deviation.
 std::vector<SentFrame> sentFrames(unsigned K, unsigned count, double deviation, unsigned seed);
 
 struct Accident {

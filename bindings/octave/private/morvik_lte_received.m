@@ -1,4 +1,4 @@
-% What is added to soft buffers: ratios as single, or whole steps as int16 for soft buffers of `width` bits.
+% What is added to soft buffers: ratios as single, or integers as int16 for soft buffers of `width` bits.
 function [received, width] = morvik_lte_received(caller, received, width)
     if isempty(width)
         received = morvik_lte_ratios(caller, 'ratios', received);
@@ -8,7 +8,7 @@ function [received, width] = morvik_lte_received(caller, received, width)
     width = morvik_lte_number(caller, 'width', width, 2, 16);
     if ~(isa(received, 'int8') || isa(received, 'int16')) || ndims(received) > 2
         error('morvik:badClass', ...
-            '%s: with a width, ratios have to be whole steps, a matrix of class int8 or int16, not %s', ...
+            '%s: with a width, ratios have to be integers, a matrix of class int8 or int16, not %s', ...
             caller, class(received));
     end
     received = int16(received);

@@ -4,7 +4,7 @@ function streams = morvik_lte_values(caller, format, buffers, modulation, scale,
     if isa(buffers, 'int16')
         kind = 'int16';
         if ~isempty(scale)
-            error('morvik:badValue', '%s: scale has to be [] for buffers of whole steps, which were scaled before', caller);
+            error('morvik:badValue', '%s: scale has to be [] for buffers of integers, which were scaled before', caller);
         end
     end
     rows = morvik_lte_call(caller, 'transport_buffer', format);

@@ -190,12 +190,12 @@
 %!error <filler has to be a whole number from -128 to 127> morvik_lte_deinterleave(ones(132, 1, 'int8'), 40, 'filler', 128);
 %!error <filler has to be one number> morvik_lte_deinterleave(ones(132, 1), 40, 'filler', [1 2]);
 %!error <buffers have to be of 132 rows, not 131> morvik_lte_deinterleave(ones(131, 1), 40);
-%!error <whole steps, a matrix of class int8 or int16, not double> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'width', 6);
+%!error <integers, a matrix of class int8 or int16, not double> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'width', 6);
 %!error <width has to be a whole number from 2 to 16> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'width', 17);
 %!error <width has to be a whole number from 2 to 16> morvik_lte_soft_values(1, 4, 1);
 %!error <of class single here, not int16> morvik_lte_recover(ones(80, 1), 16, 'qpsk', 'buffers', zeros(132, 1, 'int16'));
 %!error <of class int16 here, not double> morvik_lte_rate_recover(int8(1), 40, 'width', 6, 'buffers', zeros(132, 1));
-%!error <scale has to be \[\] for buffers of whole steps> morvik_lte_decode(zeros(132, 1, 'int16'), 16, 80, 'qpsk', 'scale', 1);
+%!error <scale has to be \[\] for buffers of integers> morvik_lte_decode(zeros(132, 1, 'int16'), 16, 80, 'qpsk', 'scale', 1);
 %!error <decisions have to be a cell of 1 code blocks> morvik_lte_join({}, 16, 80, 'qpsk');
 %!error <decisions on code block 1 have to be 40x1, not 39x1> morvik_lte_join({ones(39, 1)}, 16, 80, 'qpsk');
 %!error id=morvik:badCall morvik_lte_streams();

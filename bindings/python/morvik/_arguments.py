@@ -112,7 +112,7 @@ def real(name: str, value: Any) -> float:
 
 
 def scale_thousandths(value: Any) -> int:
-    """A scale, in thousandths of a step."""
+    """A scale, in thousandths."""
     return thousandths("scale", value, 0.001, 1000)
 
 

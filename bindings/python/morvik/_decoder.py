@@ -44,7 +44,7 @@ class Decoded(NamedTuple):
 
     llrs: npt.NDArray[np.int16] | None
     """Log-likelihood ratios of the last half-iteration, or None if not requested: int16 of the shape of ``bits``.
-    128 steps per unit; a ratio of 0 or more decides for bit 1. They wrap like the hardware's 12-bit metrics."""
+    In units of 1/128; a ratio of 0 or more decides for bit 1. They wrap like the hardware's 12-bit metrics."""
 
 
 class Decoder:
@@ -105,7 +105,7 @@ class Decoder:
         ``sys``, ``par1``, ``par2``
             Soft values: the systematic bits and the parities of the first and the second encoder, each of shape
             (K + 4,) for a block or (n, K + 4) for a batch. The last four positions hold the twelve tail values in the
-            order of :func:`encode`, that of the standard. 8 steps per unit; a positive value favours bit 1. The core
+            order of :func:`encode`, that of the standard. They are in eighths; a positive value favours bit 1. The core
             takes the low 24 bits of a value and clips them to -128 ... 127.
 
             int8, int16 and int32 in C order are read in place; other signed integers, orders and strides are copied.

@@ -80,7 +80,7 @@ def awgn(
     ``algorithm``
         The decoder's algorithm, for which the scale is chosen.
     ``scale``
-        Steps of a soft value for amplitude 1: above 0, up to 1000. None chooses it for the algorithm: 8 for
+        The soft value for amplitude 1: above 0, up to 1000. None chooses it for the algorithm: 8 for
         ``"max-log"`` and ``"scaled"``, 8 / variance of the noise for ``"table"``.
     ``rng``
         A NumPy generator, or the seed of a new one.

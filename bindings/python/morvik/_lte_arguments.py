@@ -67,7 +67,7 @@ def checked_ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.
 def checked_steps(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
     array = plain_array(name, values)
     if array.dtype not in (np.int8, np.int16):
-        raise TypeError(f"{name} must hold whole steps, as int8 or int16, with a width, not {array.dtype}")
+        raise TypeError(f"{name} must hold integers, as int8 or int16, with a width, not {array.dtype}")
     if array.ndim == 0:
         raise ValueError(f"{name} must be an array, not a number")
     return np.ascontiguousarray(array, np.int16)

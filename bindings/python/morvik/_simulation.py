@@ -143,7 +143,7 @@ def error_rate(
     ``num_pu``, ``algorithm``
         As for :class:`Decoder`, with the same defaults.
     ``scale``
-        Steps of a soft value, for amplitude 1 with plain code blocks over BPSK and Gaussian noise, otherwise for a
+        The soft value for amplitude 1 with plain code blocks over BPSK and Gaussian noise, otherwise for a
         log-likelihood ratio of 1: above 0 up to 1000; None chooses it for algorithm, modulation and code rate.
     ``iterations``
         1 to 15; with ``each_iteration``, errors after each iteration up to the number are counted.

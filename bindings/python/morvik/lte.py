@@ -194,7 +194,7 @@ def rate_recover(
     """Rate recovery of code blocks: adds the ratios of a transmission to soft buffers.
 
     ``llrs``
-        Ratios of shape (E,) or (n, E); with ``width``, whole steps as :func:`soft_values` gives them.
+        Ratios of shape (E,) or (n, E); with ``width``, integers as :func:`soft_values` gives them.
     ``block_size``
         K.
     ``version``, ``fillers``, ``buffer_size``
@@ -269,7 +269,7 @@ def soft_values(llrs: npt.ArrayLike, scale: float, width: int = 8) -> npt.NDArra
     ``llrs``
         Of any shape, finite.
     ``scale``
-        Steps for a ratio of 1, such as :func:`scale_of` tells.
+        The soft value for a ratio of 1, such as :func:`scale_of` returns.
     ``width``
         Bits of a soft value. 8 gives int8, what :meth:`morvik.Decoder.decode` takes; other widths, 2 to 16, give int16,
         for soft buffers of this width.
@@ -455,7 +455,7 @@ class Transport:
         ``buffers``
             What earlier transmissions left; None before the first one. It is not changed.
         ``width``
-            Bits of a soft buffer's values, 2 to 16: ``llrs`` are then whole steps, as :func:`soft_values` gives them
+            Bits of a soft buffer's values, 2 to 16: ``llrs`` are then integers, as :func:`soft_values` gives them
             with this width, and each sum is clipped to it. None adds in floating point.
 
         Returns the soft buffers: float32, or int16 with ``width``.
@@ -476,16 +476,16 @@ class Transport:
         """The soft values of each code block, for :meth:`morvik.Decoder.decode`: int8 of shape (K + 4,) or (n, K + 4).
 
         ``buffers``
-            What :meth:`recover` returns. Those of whole steps are only clipped.
+            What :meth:`recover` returns. Integers are only clipped.
         ``scale``
-            Steps for a ratio of 1; None is :func:`scale_of` one transmission and the algorithm.
+            The soft value for a ratio of 1; None is :func:`scale_of` one transmission and the algorithm.
         ``algorithm``
             The decoder's algorithm.
         """
         array = plain_array("buffers", buffers)
         is_steps = array.dtype == np.int16
         if is_steps and scale is not None:
-            raise ValueError("scale must be None for buffers of whole steps, which were scaled before")
+            raise ValueError("scale must be None for buffers of integers, which were scaled before")
         if not is_steps:
             array = checked_ratios(array, "buffers")
         self._expect_columns("buffers", array, self._core.buffer_size)

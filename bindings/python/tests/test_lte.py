@@ -237,7 +237,7 @@ LLRS = np.ones(2400)
         (lambda: CHAIN.recover(LLRS[1:]), ValueError, "llrs must have 2400 values for each block, not 2399"),
         (lambda: CHAIN.recover([[1.0, np.nan]]), ValueError, r"llrs must be finite, but \[0, 1\] is nan"),
         (lambda: CHAIN.recover(LLRS, buffers=BITS), ValueError, "buffers must be float32 of shape"),
-        (lambda: CHAIN.recover(LLRS, width=6), TypeError, "llrs must hold whole steps, as int8 or int16"),
+        (lambda: CHAIN.recover(LLRS, width=6), TypeError, "llrs must hold integers, as int8 or int16"),
         (lambda: CHAIN.recover(LLRS.astype(int)[None, None]), ValueError, "one or two dimensions, not 3"),
         (lambda: CHAIN.soft_values(LLRS), ValueError, "buffers must have 3084 values for each block, not 2400"),
         (lambda: CHAIN.soft_values(np.zeros(3084), 0), ValueError, "scale must be a positive number"),
