@@ -1,4 +1,4 @@
-// CSteps: the functions of include/morvik_link.h for single steps of the chain.
+// CSteps: the functions of include/morvik_link.h for single stages of the chain.
 #include <algorithm>
 #include <array>
 #include <cmath>
@@ -212,19 +212,19 @@ std::int32_t morvik_link_rate_recover_i16(std::uint32_t K,
                                           std::uint32_t bufferSize,
                                           std::uint32_t version,
                                           std::size_t blocks,
-                                          const std::int16_t* steps,
+                                          const std::int16_t* ratios,
                                           std::size_t count,
                                           std::uint32_t width,
                                           std::int16_t* buffers)
 {
-    if (anyNullOf(blocks, buffers) || anyNullOf(std::min(blocks, count), steps)) {
+    if (anyNullOf(blocks, buffers) || anyNullOf(std::min(blocks, count), ratios)) {
         return MORVIK_LINK_NULL_POINTER;
     }
     const std::int32_t status = firstOf(checkedCodeBlock(K, fillers), checkedVersion(version), checkedWidth(width));
     return guarded(status, [=] {
         const link::RateMatching matching(K, fillers, unlimited(bufferSize));
         for (std::size_t b = 0; b < blocks; ++b) {
-            matching.recover(steps + b * count, version, count, width, buffers + b * matching.size());
+            matching.recover(ratios + b * count, version, count, width, buffers + b * matching.size());
         }
     });
 }

@@ -58,7 +58,7 @@ TransportSource::TransportSource(const TransportSetting& setting, std::uint64_t 
       itsLink(setting.symbols, itsKey, form),
       itsAddsNothing(setting.versions.size() == 1 && setting.softBufferBits == 0 && itsCode.sendsOnce()),
       itsRatios(setting.codedBits),
-      itsSteps(setting.softBufferBits == 0 ? 0 : setting.codedBits),
+      itsRounded(setting.softBufferBits == 0 ? 0 : setting.codedBits),
       itsReceived(itsAddsNothing ? setting.codedBits : 0),
       itsValues(itsCode.softSize())
 {
@@ -76,7 +76,7 @@ void TransportSource::begin(std::uint64_t first, unsigned count)
     // One buffer serves all frames where nothing is sent again, and none is needed where nothing adds up.
     const std::size_t buffers = itsAddsNothing ? 0 : itsSetting.versions.size() > 1 ? count : 1;
     itsSoftBuffers.resize(itsSetting.softBufferBits == 0 ? buffers * itsCode.softSize() : 0);
-    itsStepBuffers.resize(itsSetting.softBufferBits == 0 ? 0 : buffers * itsCode.softSize());
+    itsRoundedBuffers.resize(itsSetting.softBufferBits == 0 ? 0 : buffers * itsCode.softSize());
 }
 
 void TransportSource::transmit(const std::vector<unsigned>& frames,
@@ -89,7 +89,7 @@ void TransportSource::transmit(const std::vector<unsigned>& frames,
     for (const unsigned frame : frames) {
         clipped[frame] += itsAddsNothing                   ? place(frame)
                           : itsSetting.softBufferBits == 0 ? recover(frame, transmission)
-                                                           : recoverSteps(frame, transmission);
+                                                           : recoverIntegers(frame, transmission);
         for (unsigned r = 0; r < itsCode.blocks().count; ++r) {
             const unsigned kind = r < itsCode.blocks().countMinus ? 0 : 1;
             CodeBlockBatch& batch = batches.at(kind);
@@ -142,7 +142,7 @@ std::uint32_t TransportSource::recover(unsigned frame, unsigned transmission)
 }
 
 /// The same with a soft buffer of few bits. What it holds at an end of its range counts as clipped.
-std::uint32_t TransportSource::recoverSteps(unsigned frame, unsigned transmission)
+std::uint32_t TransportSource::recoverIntegers(unsigned frame, unsigned transmission)
 {
     const unsigned width = itsSetting.softBufferBits;
     receive(frame, transmission);
@@ -150,9 +150,9 @@ std::uint32_t TransportSource::recoverSteps(unsigned frame, unsigned transmissio
                itsRatios.size(),
                static_cast<float>(itsSetting.scales[transmission]),
                width,
-               itsSteps.data());
-    std::int16_t* const buffer = bufferOf(itsStepBuffers, frame, transmission);
-    itsCode.recover(itsSteps.data(), itsSetting.versions[transmission], width, buffer);
+               itsRounded.data());
+    std::int16_t* const buffer = bufferOf(itsRoundedBuffers, frame, transmission);
+    itsCode.recover(itsRounded.data(), itsSetting.versions[transmission], width, buffer);
     softValues(buffer, itsCode.softSize(), itsValues.data());
     const int end = 1 << (std::min(width, 8U) - 1);
     return static_cast<std::uint32_t>(std::count_if(

@@ -77,7 +77,7 @@ private:
     void receive(unsigned frame, unsigned transmission);
     std::uint32_t place(unsigned frame);
     std::uint32_t recover(unsigned frame, unsigned transmission);
-    std::uint32_t recoverSteps(unsigned frame, unsigned transmission);
+    std::uint32_t recoverIntegers(unsigned frame, unsigned transmission);
     void layOut(const std::vector<unsigned>& frames, std::array<CodeBlockBatch, 2>& batches) const;
 
     TransportSetting itsSetting;
@@ -92,10 +92,10 @@ private:
     PackedBlocks itsBuffers;
     std::vector<std::uint64_t> itsCoded;
     std::vector<float> itsRatios;
-    std::vector<std::int16_t> itsSteps;
-    std::vector<float> itsSoftBuffers;         ///< if values are added up as floats,
-    std::vector<std::int16_t> itsStepBuffers;  ///< or in steps
-    std::vector<std::int8_t> itsReceived;      ///< if nothing is added up
+    std::vector<std::int16_t> itsRounded;
+    std::vector<float> itsSoftBuffers;            ///< if values are added up as floats,
+    std::vector<std::int16_t> itsRoundedBuffers;  ///< or in steps
+    std::vector<std::int8_t> itsReceived;         ///< if nothing is added up
     std::vector<std::int8_t> itsValues;
 };
 

@@ -75,7 +75,7 @@ Streams<Element> streamsOf(std::size_t blocks, std::uint32_t K)
     return {matrix<Element>(blocks, positions), matrix<Element>(blocks, positions), matrix<Element>(blocks, positions)};
 }
 
-// ---- Steps
+// ---- Single stages
 
 Array<std::uint8_t> crc(const Array<std::uint8_t>& bits, bool isOfCodeBlock)
 {
@@ -139,19 +139,19 @@ void rateRecover(const Matching& matching, std::uint32_t version, const Array<fl
                                     buffers.mutable_data()));
 }
 
-void rateRecoverSteps(const Matching& matching,
-                      std::uint32_t version,
-                      const Array<std::int16_t>& steps,
-                      std::uint32_t width,
-                      Array<std::int16_t>& buffers)
+void rateRecoverIntegers(const Matching& matching,
+                         std::uint32_t version,
+                         const Array<std::int16_t>& ratios,
+                         std::uint32_t width,
+                         Array<std::int16_t>& buffers)
 {
     expect(morvik_link_rate_recover_i16(matching[0],
                                         matching[1],
                                         matching[2],
                                         version,
-                                        rows(steps),
-                                        steps.data(),
-                                        columns(steps),
+                                        rows(ratios),
+                                        ratios.data(),
+                                        columns(ratios),
                                         width,
                                         buffers.mutable_data()));
 }
@@ -194,7 +194,7 @@ Array<std::int8_t> softValues(const Array<float>& ratios, float scale)
     return values;
 }
 
-Array<std::int16_t> softSteps(const Array<float>& ratios, float scale, std::uint32_t width)
+Array<std::int16_t> softIntegers(const Array<float>& ratios, float scale, std::uint32_t width)
 {
     Array<std::int16_t> values(ratios.size());
     run([&, to = values.mutable_data()] {
@@ -302,13 +302,14 @@ public:
         });
     }
 
-    void recoverSteps(std::uint32_t version,
-                      const Array<std::int16_t>& steps,
-                      std::uint32_t width,
-                      Array<std::int16_t>& buffers) const
+    void recoverIntegers(std::uint32_t version,
+                         const Array<std::int16_t>& ratios,
+                         std::uint32_t width,
+                         Array<std::int16_t>& buffers) const
     {
         run([&, to = buffers.mutable_data()] {
-            return morvik_link_transport_recover_i16(itsTransport.get(), version, rows(steps), steps.data(), width, to);
+            return morvik_link_transport_recover_i16(
+                itsTransport.get(), version, rows(ratios), ratios.data(), width, to);
         });
     }
 
@@ -322,7 +323,7 @@ public:
         return streams;
     }
 
-    Streams<std::int8_t> softValuesOfSteps(std::uint32_t r, const Array<std::int16_t>& buffers) const
+    Streams<std::int8_t> softValuesOfIntegers(std::uint32_t r, const Array<std::int16_t>& buffers) const
     {
         Streams<std::int8_t> streams = streamsOf<std::int8_t>(rows(buffers), placesOf(r).size);
         expect(morvik_link_transport_soft_values_i16(itsTransport.get(),
@@ -384,14 +385,14 @@ void addTransport(py::module_& module)
         .def("code_block", &Transport::codeBlock, arg("r"))
         .def("encode", &Transport::encode, arg("version"), arg("bits").noconvert())
         .def("recover", &Transport::recover, arg("version"), arg("ratios").noconvert(), arg("buffers").noconvert())
-        .def("recover_steps",
-             &Transport::recoverSteps,
+        .def("recover_integers",
+             &Transport::recoverIntegers,
              arg("version"),
-             arg("steps").noconvert(),
+             arg("ratios").noconvert(),
              arg("width"),
              arg("buffers").noconvert())
         .def("soft_values", &Transport::softValues, arg("r"), arg("buffers").noconvert(), arg("scale"))
-        .def("soft_values_of_steps", &Transport::softValuesOfSteps, arg("r"), arg("buffers").noconvert())
+        .def("soft_values_of_integers", &Transport::softValuesOfIntegers, arg("r"), arg("buffers").noconvert())
         .def("join", &Transport::join, arg("r"), arg("decisions").noconvert(), arg("bits").noconvert())
         .def("check", &Transport::check, arg("bits").noconvert());
 }
@@ -411,18 +412,18 @@ void addLte(py::module_& module)
                arg("version"),
                arg("ratios").noconvert(),
                arg("buffers").noconvert());
-    module.def("rate_recover_steps",
-               rateRecoverSteps,
+    module.def("rate_recover_integers",
+               rateRecoverIntegers,
                arg("matching"),
                arg("version"),
-               arg("steps").noconvert(),
+               arg("ratios").noconvert(),
                arg("width"),
                arg("buffers").noconvert());
     module.def("deinterleave", deinterleave<float>, arg("matching"), arg("buffers").noconvert(), arg("filler"));
     module.def(
-        "deinterleave_steps", deinterleave<std::int8_t>, arg("matching"), arg("buffers").noconvert(), arg("filler"));
+        "deinterleave_integers", deinterleave<std::int8_t>, arg("matching"), arg("buffers").noconvert(), arg("filler"));
     module.def("soft_values", softValues, arg("ratios").noconvert(), arg("scale"));
-    module.def("soft_steps", softSteps, arg("ratios").noconvert(), arg("scale"), arg("width"));
+    module.def("soft_integers", softIntegers, arg("ratios").noconvert(), arg("scale"), arg("width"));
     module.def(
         "ratio_scale",
         [](int algorithm, std::uint32_t bitsPerSymbol, double codeRate) {

@@ -95,12 +95,12 @@ def awgn(
     milli_decibels = ebn0_thousandths(ebn0_db)
     number = integer("algorithm", algorithm_number(algorithm), 0, 2)
     if scale is None:
-        steps = _core.default_scale(number, positions - TAIL, milli_decibels)
+        factor = _core.default_scale(number, positions - TAIL, milli_decibels)
     else:
-        steps = scale_thousandths(scale) / 1000
+        factor = scale_thousandths(scale) / 1000
     seed = int.from_bytes(np.random.default_rng(rng).bytes(8), "little")
     rows = [np.ascontiguousarray(array.reshape(-1, positions)) for array in arrays]
-    received = _core.transmit(rows, milli_decibels, steps, seed)
+    received = _core.transmit(rows, milli_decibels, factor, seed)
     return Streams(*(stream.reshape(arrays[0].shape) for stream in received))
 
 

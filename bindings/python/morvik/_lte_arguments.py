@@ -64,7 +64,7 @@ def checked_ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.
     return np.ascontiguousarray(array, np.float32)
 
 
-def checked_steps(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
+def checked_integers(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
     array = plain_array(name, values)
     if array.dtype not in (np.int8, np.int16):
         raise TypeError(f"{name} must hold integers, as int8 or int16, with a width, not {array.dtype}")
@@ -76,7 +76,7 @@ def checked_steps(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
 def checked_received(llrs: npt.ArrayLike, width: int | None) -> npt.NDArray[Any]:
     if width is None:
         return checked_ratios(llrs)
-    return checked_steps("llrs", llrs)
+    return checked_integers("llrs", llrs)
 
 
 def rows_of(array: npt.NDArray[Any]) -> npt.NDArray[Any]:

@@ -130,7 +130,7 @@ class Received(NamedTuple):
     block."""
 
 
-# ---- Steps
+# ---- Single stages
 
 
 def crc24a(bits: npt.ArrayLike) -> npt.NDArray[np.uint8]:
@@ -214,7 +214,7 @@ def rate_recover(
     if width is None:
         _core.rate_recover(matching, checked_version(version), received, sums)
     else:
-        _core.rate_recover_steps(matching, checked_version(version), received, checked_width(width), sums)
+        _core.rate_recover_integers(matching, checked_version(version), received, checked_width(width), sums)
     return sums.reshape(*array.shape[:-1], -1)
 
 
@@ -244,7 +244,7 @@ def deinterleave(
         raise ValueError(f"buffers must have {size} values for each block, not {array.shape[-1]}")
     streams: list[npt.NDArray[Any]]
     if array.dtype == np.int8:
-        streams = _core.deinterleave_steps(matching, rows_of(array), integer("filler", filler, -128, 127))
+        streams = _core.deinterleave_integers(matching, rows_of(array), integer("filler", filler, -128, 127))
     else:
         streams = _core.deinterleave(matching, rows_of(array), real("filler", filler))
     return Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams))
@@ -275,13 +275,13 @@ def soft_values(llrs: npt.ArrayLike, scale: float, width: int = 8) -> npt.NDArra
         for soft buffers of this width.
     """
     array = checked_ratios(llrs)
-    steps = positive("scale", scale)
+    factor = positive("scale", scale)
     flat = np.ascontiguousarray(array.reshape(-1))
     values: npt.NDArray[Any]
     if checked_width(width) == 8:
-        values = _core.soft_values(flat, steps)
+        values = _core.soft_values(flat, factor)
     else:
-        values = _core.soft_steps(flat, steps, width)
+        values = _core.soft_integers(flat, factor, width)
     return values.reshape(array.shape)
 
 
@@ -467,7 +467,7 @@ class Transport:
         if width is None:
             self._core.recover(checked_version(version), received, sums)
         else:
-            self._core.recover_steps(checked_version(version), received, checked_width(width), sums)
+            self._core.recover_integers(checked_version(version), received, checked_width(width), sums)
         return sums.reshape(*array.shape[:-1], -1)
 
     def soft_values(
@@ -483,18 +483,18 @@ class Transport:
             The decoder's algorithm.
         """
         array = plain_array("buffers", buffers)
-        is_steps = array.dtype == np.int16
-        if is_steps and scale is not None:
+        are_integers = array.dtype == np.int16
+        if are_integers and scale is not None:
             raise ValueError("scale must be None for buffers of integers, which were scaled before")
-        if not is_steps:
+        if not are_integers:
             array = checked_ratios(array, "buffers")
         self._expect_columns("buffers", array, self._core.buffer_size)
         rows = rows_of(array)
         if scale is None:
             scale = scale_of(self._modulation, self._size / self._coded_bits, algorithm=algorithm)
-        steps = positive("scale", scale)
+        factor = positive("scale", scale)
         blocks = (
-            self._core.soft_values_of_steps(r, rows) if is_steps else self._core.soft_values(r, rows, steps)
+            self._core.soft_values_of_integers(r, rows) if are_integers else self._core.soft_values(r, rows, factor)
             for r in range(self._code_blocks.number)
         )
         return [Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams)) for streams in blocks]
