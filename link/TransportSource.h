@@ -94,7 +94,7 @@ private:
     std::vector<float> itsRatios;
     std::vector<std::int16_t> itsRounded;
     std::vector<float> itsSoftBuffers;            ///< if values are added up as floats,
-    std::vector<std::int16_t> itsRoundedBuffers;  ///< or in steps
+    std::vector<std::int16_t> itsRoundedBuffers;  ///< or as integers
     std::vector<std::int8_t> itsReceived;         ///< if nothing is added up
     std::vector<std::int8_t> itsValues;
 };

@@ -23,8 +23,8 @@ struct Case {
 enum class Rows : std::uint8_t {
     right,        ///< K + 4
     tailMissing,  ///< K to K + 3; the tail is taken for unknown
-    first,        ///< more than K + 4, its own ones first
-    last,         ///< more than K + 4, its own ones last
+    first,        ///< more than K + 4, the own rows first
+    last,         ///< more than K + 4, the own rows last
     ends,         ///< more than K + 4: data first, tail last
     smaller,      ///< as many as the reference says, but both were padded at the end
 };
