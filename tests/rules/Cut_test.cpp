@@ -68,6 +68,8 @@ TEST(Cut, OfNoBlockHasNoWindow)
         EXPECT_EQ(none.windows(), 0U);
         EXPECT_TRUE(none.dividesEvenly());
     }
+    EXPECT_EQ(Cut().segmentsOfUnit(), 1U);
+    EXPECT_EQ(Cut().unitsAtWork(), 1U);
 }
 
 TEST(Cut, WindowsCoverEachStepOnceRowByRow)

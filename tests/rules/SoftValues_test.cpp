@@ -19,6 +19,7 @@ TEST(Formats, HaveTheRangesOfTheTable)
 {
     EXPECT_EQ(smallestOf(inputBits), -128);
     EXPECT_EQ(largestOf(inputBits), 127);
+    EXPECT_EQ(smallestOf(branchBits), -128);
     EXPECT_EQ(smallestOf(stateBits), -2048);
     EXPECT_EQ(largestOf(stateBits), 2047);
     EXPECT_EQ(branchSmallest, -2048);
