@@ -166,9 +166,6 @@ EQUIVALENT = {
         ("positions 0 and 1 of a stream are dummy bits in every block size",
          [("written + 1 : 0", "written + 1 : 1"), ("unsigned i = 1; i < total", "unsigned i = 0; i < total")]),
     ],
-    "link/modulation/Mapper.cpp": [
-        ("no symbols of one entry more are copied", [("left > 0", "left >= 0")]),
-    ],
     "link/coding/TurboEncoder.cpp": [
         ("the interleaver with an element more", [("unsigned i = 0; i < K", "unsigned i = 0; i <= K")]),
     ],
