@@ -24,7 +24,7 @@ function ratios = morvik_lte_demap(symbols, modulation, noise_variance, varargin
     demapper = morvik_lte_choice(caller, 'demapper', options.demapper, {'max-log', 'exact'}) - 1;
     if ~isnumeric(symbols) || issparse(symbols) || ndims(symbols) > 2 || count == 1 && ~isreal(symbols)
         error('morvik:badClass', '%s: symbols have to be a full matrix of numbers, real for bpsk', caller);
-    elseif any(~isfinite(symbols(:)))
+    elseif any(~isfinite(single(symbols(:))))
         error('morvik:badValue', '%s: symbols have to be finite', caller);
     end
     parts = single(real(symbols));

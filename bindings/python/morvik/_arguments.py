@@ -129,9 +129,10 @@ def expect_unmasked(name: str, values: Any) -> None:
 
 
 def plain_array(name: str, values: npt.ArrayLike) -> npt.NDArray[Any]:
-    """The values as an array."""
+    """The values as an array. An empty list has no type: its array has the least that is a number."""
     expect_unmasked(name, values)
-    return np.asarray(values)
+    array = np.asarray(values)
+    return array.astype(np.int8) if array.size == 0 and isinstance(values, (list, tuple)) else array
 
 
 def each(name: str, values: Any, check: Callable[[Any], Value]) -> list[Value]:

@@ -2,6 +2,7 @@
 
 from __future__ import annotations
 
+import math
 from typing import Any
 
 import numpy as np
@@ -45,9 +46,35 @@ def checked_width(value: Any) -> int:
 
 def positive(name: str, value: Any) -> float:
     number = real(name, value)
-    if not 0 < number < 3e38 or np.float32(number) == 0:
+    if number <= 0 or float32_of(number) in (0, np.inf):
         raise ValueError(f"{name} must be a positive number that float32 holds, not {value!r}")
     return number
+
+
+def single(name: str, value: Any) -> float:
+    """A number that float32 holds."""
+    number = real(name, value)
+    if np.isinf(float32_of(number)):
+        raise ValueError(f"{name} must be a number that float32 holds, not {value!r}")
+    return number
+
+
+def float32_of(number: float) -> np.float32:
+    with np.errstate(over="ignore", under="ignore"):
+        return np.float32(number)
+
+
+def finite(name: str, array: npt.NDArray[Any], dtype: Any) -> npt.NDArray[Any]:
+    """The numbers as a type of single precision, in C order. What is not finite there is refused with its place."""
+    with np.errstate(over="ignore", under="ignore"):
+        numbers = np.ascontiguousarray(array, dtype)
+    wrong = np.argwhere(~np.isfinite(numbers))
+    if len(wrong) > 0:
+        place = ", ".join(str(index) for index in wrong[0])
+        number = array[tuple(wrong[0])]
+        bound = " in float32" if np.isfinite(number) else ""
+        raise ValueError(f"{name} must be finite{bound}, but [{place}] is {number}")
+    return numbers
 
 
 def checked_ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.float32]:
@@ -57,11 +84,7 @@ def checked_ratios(values: npt.ArrayLike, name: str = "llrs") -> npt.NDArray[np.
         raise TypeError(f"{name} must hold real numbers, not {array.dtype}")
     if array.ndim == 0:
         raise ValueError(f"{name} must be an array, not a number")
-    wrong = np.argwhere(~np.isfinite(array))
-    if len(wrong) > 0:
-        place = ", ".join(str(index) for index in wrong[0])
-        raise ValueError(f"{name} must be finite, but [{place}] is {array[tuple(wrong[0])]}")
-    return np.ascontiguousarray(array, np.float32)
+    return finite(name, array, np.float32)
 
 
 def checked_integers(name: str, values: npt.ArrayLike) -> npt.NDArray[np.int16]:
@@ -79,10 +102,14 @@ def checked_received(llrs: npt.ArrayLike, width: int | None) -> npt.NDArray[Any]
     return checked_integers("llrs", llrs)
 
 
+def counted(count: int, noun: str) -> str:
+    return f"{count} {noun}" if count == 1 else f"{count} {noun}s"
+
+
 def rows_of(array: npt.NDArray[Any]) -> npt.NDArray[Any]:
     if array.ndim > 2:
         raise ValueError(f"arrays must have one or two dimensions, not {array.ndim}")
-    return array.reshape(-1, array.shape[-1])
+    return array.reshape(math.prod(array.shape[:-1]), array.shape[-1])  # -1 would need a value in a row
 
 
 def sums_of(buffers: Any, shape: tuple[int, ...], dtype: Any) -> npt.NDArray[Any]:

@@ -32,7 +32,6 @@ from morvik._arguments import (
     expect_block,
     integer,
     plain_array,
-    real,
     thousandths,
 )
 from morvik._decoder import Decoder
@@ -46,8 +45,11 @@ from morvik._lte_arguments import (
     checked_transport_block_size,
     checked_version,
     checked_width,
+    counted,
+    finite,
     positive,
     rows_of,
+    single,
     sums_of,
 )
 
@@ -246,7 +248,7 @@ def deinterleave(
     if array.dtype == np.int8:
         streams = _core.deinterleave_integers(matching, rows_of(array), integer("filler", filler, -128, 127))
     else:
-        streams = _core.deinterleave(matching, rows_of(array), real("filler", filler))
+        streams = _core.deinterleave(matching, rows_of(array), single("filler", filler))
     return Streams(*(stream.reshape(*array.shape[:-1], -1) for stream in streams))
 
 
@@ -326,18 +328,18 @@ def demap(
     ``demapper``
         ``"max-log"``, by the nearest points alone, or ``"exact"``, by all points.
 
-    Returns float32: the last dimension is longer by the bits of a symbol.
+    Returns float32, finite: the last dimension is longer by the bits of a symbol.
     """
     count = bits_per_symbol(modulation)
     array = plain_array("symbols", symbols)
-    if array.dtype.kind not in ("iuf" if count == 1 else "iufc") or array.ndim == 0:
+    if array.dtype.kind not in ("iuf" if count == 1 else "iufc"):
         raise TypeError(f"symbols must be an array of {'real' if count == 1 else 'complex'} numbers, not {array.dtype}")
-    if not np.isfinite(array).all():
-        raise ValueError("symbols must be finite")
+    if array.ndim == 0:
+        raise ValueError("symbols must be an array, not a number")
+    flat = finite("symbols", array, np.float32 if count == 1 else np.complex64).reshape(-1)
     if demapper not in _DEMAPPERS:
         raise ValueError(f"demapper must be one of {', '.join(_DEMAPPERS)}, not {demapper!r}")
     amplitudes = None if gains is None else checked_gains(gains, array.shape)
-    flat = np.ascontiguousarray(array.reshape(-1).astype(np.float32 if count == 1 else np.complex64, copy=False))
     llrs = _core.demap(
         count, _DEMAPPERS.index(demapper), flat.view(np.float32), amplitudes, positive("noise_variance", noise_variance)
     )
@@ -380,7 +382,7 @@ def transmit(
             raise ValueError(f"{name} must be one of {', '.join(allowed)}, not {value!r}")
     decibels = thousandths("esn0_db", esn0_db, -50, 50)
     seed = int.from_bytes(np.random.default_rng(rng).bytes(8), "little")
-    rows = np.ascontiguousarray(array.reshape(-1, array.shape[-1]))
+    rows = np.ascontiguousarray(rows_of(array))
     return _core.transmit_symbols(rows, count, channel, demapper, decibels, seed).reshape(array.shape)
 
 
@@ -502,7 +504,7 @@ class Transport:
     def join(self, decisions: list[npt.NDArray[np.uint8]]) -> Received:
         """Puts the decisions on all code blocks together, each of shape (K,) or (n, K), and checks their CRCs."""
         if len(decisions) != self._code_blocks.number:
-            raise ValueError(f"decisions must have {self._code_blocks.number} code blocks, not {len(decisions)}")
+            raise ValueError(f"decisions must have {counted(self._code_blocks.number, 'code block')}, not {len(decisions)}")
         arrays = [bits_of("decisions", array) for array in decisions]
         shape = arrays[0].shape[:-1]
         bits = np.zeros((math.prod(shape), self._size + _CRC_BITS), np.uint8)
@@ -575,7 +577,7 @@ class Transport:
             below = max(self._coded_bits // symbol * symbol, least)
             raise ValueError(
                 f"coded_bits must be a multiple of the {symbol} bits of a symbol, at least {least} for "
-                f"{self._code_blocks.number} code blocks, not {self._coded_bits}; {below} would fit"
+                f"{counted(self._code_blocks.number, 'code block')}, not {self._coded_bits}; {below} would fit"
             )
 
     @staticmethod
@@ -586,5 +588,5 @@ class Transport:
 
 def _crc(bits: npt.ArrayLike, is_of_code_block: bool) -> npt.NDArray[np.uint8]:
     array = bits_of("bits", bits)
-    parity = _core.crc(np.ascontiguousarray(array.reshape(-1, array.shape[-1])), is_of_code_block)
+    parity = _core.crc(np.ascontiguousarray(rows_of(array)), is_of_code_block)
     return parity.reshape(*array.shape[:-1], _CRC_BITS)

@@ -229,6 +229,7 @@ LLRS = np.ones(2400)
         (lambda: lte.Transport(0, 100), ValueError, "transport_block_size must be in the range 1 to 16777216, not 0"),
         (lambda: lte.Transport(1000, 2401), ValueError, "multiple of the 2 bits of a symbol.* 2400 would fit"),
         (lambda: lte.Transport(20000, 4), ValueError, "at least 8 for 4 code blocks, not 4; 8 would fit"),
+        (lambda: lte.Transport(100, 1), ValueError, "at least 2 for 1 code block, not 1; 2 would fit"),
         (lambda: lte.Transport(1000, 2400, "8psk"), ValueError, "modulation must be one of bpsk, qpsk, 16qam"),
         (lambda: lte.Transport(6000, 9000, soft_buffer_size=1), morvik.Error, "soft buffer.*soft_buffer_size=1"),
         (lambda: lte.Transport(1000, 2400, layers=5), ValueError, "layers must be in the range 1 to 4"),
@@ -242,7 +243,7 @@ LLRS = np.ones(2400)
         (lambda: CHAIN.soft_values(LLRS), ValueError, "buffers must have 3084 values for each block, not 2400"),
         (lambda: CHAIN.soft_values(np.zeros(3084), 0), ValueError, "scale must be a positive number"),
         (lambda: CHAIN.soft_values(np.zeros(3084, np.int16), 8), ValueError, "scale must be None for buffers of whole"),
-        (lambda: CHAIN.join([BITS, BITS]), ValueError, "decisions must have 1 code blocks, not 2"),
+        (lambda: CHAIN.join([BITS, BITS]), ValueError, "decisions must have 1 code block, not 2"),
         (lambda: CHAIN.code_block(1), ValueError, "r must be in the range 0 to 0, not 1"),
         (lambda: lte.segment(2**24 + 1), ValueError, "transport_block_size must be in the range"),
         (lambda: lte.rate_match(np.zeros((3, 40), int), 9), morvik.Error, "the tail seem to be missing"),
@@ -252,6 +253,15 @@ LLRS = np.ones(2400)
         (lambda: lte.deinterleave(LLRS, 40), ValueError, "buffers must have 132 values for each block, not 2400"),
         (lambda: lte.soft_values(1.0, 4), ValueError, "llrs must be an array, not a number"),
         (lambda: lte.soft_values([1j], 4), TypeError, "llrs must hold real numbers, not complex128"),
+        (lambda: lte.soft_values([1, -1e300], 4), ValueError, r"llrs must be finite in float32, but \[1\] is -1e\+300"),
+        (lambda: lte.deinterleave(np.zeros(132), 40, filler=1e300), ValueError, "filler must be a number that float32"),
+        (lambda: lte.demap([[1, 1e300j]], "qpsk", 1), ValueError, r"symbols must be finite in float32, but \[0, 1\] is"),
+        (lambda: lte.demap([1], "qpsk", 1, gains=[1e39]), ValueError, r"gains must be finite in float32, but \[0\] is"),
+        (lambda: lte.demap(1j, "qpsk", 1), ValueError, "symbols must be an array, not a number"),
+        (lambda: lte.demap([1], "qpsk", 1e39), ValueError, "noise_variance must be a positive number that float32 holds"),
+        (lambda: lte.demap([1], "qpsk", 1e-50), ValueError, "noise_variance must be a positive number that float32 holds"),
+        (lambda: CHAIN.encode([]), ValueError, "bits must have .* values for each block, not 0"),
+        (lambda: CHAIN.recover([], width=6), ValueError, "llrs must have .* values for each block, not 0"),
         (lambda: lte.soft_values([1.0], 4, width=17), ValueError, "width must be in the range 2 to 16"),
         (lambda: lte.scale_of("qpsk", 0), ValueError, "code_rate must be a positive number"),
         (lambda: lte.map([0, 1, 1]), ValueError, "bits must be a multiple of the 2 of a qpsk symbol, not 3"),
@@ -260,7 +270,7 @@ LLRS = np.ones(2400)
         (lambda: lte.transmit([0, 1], "qpsk", 9, channel="fog"), ValueError, "channel must be one of awgn, rayleigh"),
         (lambda: lte.demap([1j], "bpsk", 1), TypeError, "symbols must be an array of real numbers"),
         (lambda: lte.demap([1j], "qpsk", 0), ValueError, "noise_variance must be a positive number"),
-        (lambda: lte.demap([np.inf], "qpsk", 1), ValueError, "symbols must be finite"),
+        (lambda: lte.demap([np.inf], "qpsk", 1), ValueError, r"symbols must be finite, but \[0\] is"),
         (lambda: lte.demap([1j], "qpsk", 1, gains=[-1.0]), ValueError, "gains must be at least 0"),
         (lambda: lte.demap([1j], "qpsk", 1, gains=[1, 1]), ValueError, "gains must have the shape of symbols"),
         (lambda: lte.demap([1j], "qpsk", 1, demapper="best"), ValueError, "demapper must be one of max-log, exact"),
@@ -269,3 +279,19 @@ LLRS = np.ones(2400)
 def test_refuses(call, kind, text):
     with pytest.raises(kind, match=text):
         call()
+
+
+def test_nothing_is_an_empty_array():
+    assert lte.map([], "16qam").shape == (0,) and lte.demap([], "16qam", 1).shape == (0,)
+    assert lte.soft_values([], 4).shape == (0,) and lte.transmit([], "qpsk", 3).shape == (0,)
+    assert lte.crc24a([]).tolist() == [0] * 24
+    assert lte.crc24a(np.zeros((0, 40), int)).shape == (0, 24)
+
+
+@pytest.mark.parametrize("modulation", MODULATIONS.values())
+@pytest.mark.parametrize("demapper", ["max-log", "exact"])
+def test_llrs_are_finite_for_any_noise(modulation, demapper):
+    symbols = np.array([0, 0.3, -1e19, 3e38], np.float32)
+    for variance in (1e-45, 1e-38, 1):
+        assert np.isfinite(lte.demap(symbols, modulation, variance, demapper=demapper)).all()
+        assert np.isfinite(lte.demap(symbols, modulation, variance, demapper=demapper, gains=[0, 1, 1e19, 3e38])).all()
