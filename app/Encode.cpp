@@ -110,7 +110,11 @@ link::TransportBlockCode& codeFor(unsigned size,
         return known->second;
     }
     try {
-        return codes.emplace(size, transportBlockCode(size, options.transport)).first->second;
+        return codes
+            .emplace(
+                size,
+                transportBlockCode(size, options.transport, "the transport block of " + base::counted(size, "bit")))
+            .first->second;
     } catch (const base::Error& error) {
         lines.fail(error.what());
     }

@@ -1,19 +1,14 @@
 // TransportOptions: the options of subcommands that encode and decode transport blocks.
 #include "TransportOptions.h"
 
-#include <stdexcept>
-
 #include "Arguments.h"
 #include "Lists.h"
-#include "base/Error.h"
+#include "TransportFit.h"
 #include "base/Numbers.h"
 
 namespace morvik {
 
 namespace {
-
-/// Far more than any transmission has, and few enough for a row of them.
-constexpr std::uint32_t mostCodedBits = 1U << 26;
 
 CLI::Validator modulationNames()
 {
@@ -31,7 +26,7 @@ std::vector<unsigned> versionsOf(const std::string& text)
     for (const std::string& part : splitAt(',', text)) {
         const auto version = base::parseNumber<unsigned>(part);
         if (!version || *version >= link::redundancyVersions) {
-            refuse("--redundancy-version", text, "expected 0 to 3, or several with commas between them");
+            refuse(versionsOption, text, "expected 0 to 3, or several with commas between them");
         }
         versions.push_back(*version);
     }
@@ -39,6 +34,14 @@ std::vector<unsigned> versionsOf(const std::string& text)
 }
 
 }  // namespace
+
+CLI::Option* addVersionsOption(CLI::App& command,
+                               const std::function<void(const std::string&)>& take,
+                               const std::string& description)
+{
+    const std::string names = std::string(versionsOption) + ",--redundancy-version";
+    return command.add_option_function<std::string>(names, take, description)->type_name("V[,V...]")->default_str("0");
+}
 
 void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOptions& options)
 {
@@ -57,13 +60,10 @@ void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOpt
         ->type_name("M")
         ->default_str(std::string(nameOf(options.modulation)))
         ->needs(&transport);
-    command
-        .add_option_function<std::string>(
-            "--redundancy-version",
-            [&options](const std::string& text) { options.versions = versionsOf(text); },
-            "Redundancy version, 0 to 3; several are those of a transport block's transmissions")
-        ->type_name("V[,V...]")
-        ->default_str("0")
+    addVersionsOption(
+        command,
+        [&options](const std::string& text) { options.versions = versionsOf(text); },
+        "Redundancy version, 0 to 3; several are those of a transport block's transmissions")
         ->needs(&transport);
     command
         .add_option("--soft-buffer-size",
@@ -74,19 +74,16 @@ void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOpt
         ->needs(&transport);
 }
 
-link::TransportBlockCode transportBlockCode(std::uint32_t bits, const TransportOptions& options)
+link::TransportBlockCode transportBlockCode(std::uint32_t bits,
+                                            const TransportOptions& options,
+                                            const std::string& block)
 {
-    try {
-        return link::TransportBlockCode({bits,
-                                         options.codedBits,
-                                         bitsPerSymbol(options.modulation),
-                                         1,
-                                         options.softBufferSize == 0 ? link::unlimitedBuffer : options.softBufferSize});
-    } catch (const std::invalid_argument& error) {
-        throw base::Error("transport block of " + std::to_string(bits) + " bits, --coded-bits " +
-                          std::to_string(options.codedBits) + ", --modulation " +
-                          std::string(nameOf(options.modulation)) + ": " + error.what());
-    }
+    checkFit({bits, options.codedBits, options.modulation, options.softBufferSize}, block);
+    return link::TransportBlockCode({bits,
+                                     options.codedBits,
+                                     bitsPerSymbol(options.modulation),
+                                     1,
+                                     options.softBufferSize == 0 ? link::unlimitedBuffer : options.softBufferSize});
 }
 
 }  // namespace morvik

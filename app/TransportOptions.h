@@ -4,6 +4,7 @@
 
 #include <CLI/CLI.hpp>
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -19,11 +20,20 @@ struct TransportOptions {
     std::uint32_t softBufferSize = 0;  ///< 0: not limited
 };
 
-/// Adds --coded-bits, --modulation, --redundancy-version and --soft-buffer-size, which all need `transport`.
+constexpr char versionsOption[] = "--redundancy-versions";
+
+/// Adds it, with its singular as another name. `take` parses the text.
+CLI::Option* addVersionsOption(CLI::App& command,
+                               const std::function<void(const std::string&)>& take,
+                               const std::string& description);
+
+/// Adds --coded-bits, --modulation, --redundancy-versions and --soft-buffer-size, which all need `transport`.
 void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOptions& options);
 
-/// The code for transport blocks of `bits` bits. Throws base::Error, naming the options that do not go together.
-link::TransportBlockCode transportBlockCode(std::uint32_t bits, const TransportOptions& options);
+/// The code for transport blocks of `bits` bits. Throws base::Error as checkFit() does.
+link::TransportBlockCode transportBlockCode(std::uint32_t bits,
+                                            const TransportOptions& options,
+                                            const std::string& block);
 
 }  // namespace morvik
 

@@ -280,7 +280,8 @@ bool isSamePlace(const std::string& a, const std::string& b)
         const std::filesystem::path canonical = std::filesystem::weakly_canonical(path, failed);
         return failed ? path : canonical;
     };
-    return whole(a) == whole(b);
+    const std::filesystem::path place = whole(a);
+    return place == whole(b) && place != "/dev/null";  // which keeps nothing
 }
 
 }  // namespace morvik::base

@@ -76,7 +76,7 @@ void checkWritable(const std::string& name);
 /// Names are those of OutputFile; an empty one is no file.
 void expectOwnFile(const std::string& name, const std::vector<std::string>& inputs, const std::string& content);
 
-/// Whether writing one file would replace the other. Throws Error if a link leads nowhere.
+/// Whether writing one file would replace the other; /dev/null is nobody's loss. Throws Error if a link leads nowhere.
 bool isSamePlace(const std::string& a, const std::string& b);
 
 }  // namespace morvik::base

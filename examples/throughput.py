@@ -13,7 +13,14 @@ ESN0_DB = np.arange(-6, 21)
 COLOURS = {"qpsk": "C0", "16qam": "C1", "64qam": "C2"}
 
 rates = morvik.error_rate(
-    mcs=range(29), resource_blocks=6, esn0_db=ESN0_DB, iterations=6, early_stop="crc", block_errors=50, max_blocks=100
+    mcs=range(29),
+    resource_blocks=6,
+    resource_elements=138,
+    esn0_db=ESN0_DB,
+    iterations=6,
+    early_stop="crc",
+    block_errors=50,
+    max_blocks=100,
 )
 
 figure, axes = plt.subplots(figsize=(8, 5), layout="constrained")

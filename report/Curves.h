@@ -16,7 +16,7 @@ constexpr double unknown = std::numeric_limits<double>::quiet_NaN();
 /// One point of a curve. The bounds are the 95 % confidence interval; without them no bar is drawn.
 struct Sample {
     double ebn0 = 0;        // in dB, or unknown
-    double esn0 = unknown;  // in dB, if it is the axis
+    double esn0 = unknown;  // in dB, of all samples of a picture over it, or of none
 
     double ber = unknown;
     double berLow = unknown;

@@ -31,8 +31,8 @@ std::string csvOf(const std::string& fileName)
 
 class ReferenceReader {
 public:
-    explicit ReferenceReader(const std::string& fileName)
-        : itsName(fileName), itsText(csvOf(fileName)), itsLines(itsText, fileName, base::largestText)
+    ReferenceReader(const std::string& fileName, simulation::Axis axis)
+        : itsName(fileName), itsAxis(axis), itsText(csvOf(fileName)), itsLines(itsText, fileName, base::largestText)
     {
     }
 
@@ -192,9 +192,7 @@ private:
         Sample sample;
         sample.ebn0 = number("ebn0_db", -1000, 1000);
         sample.esn0 = number("esn0_db", -1000, 1000);
-        if (std::isnan(sample.place())) {
-            fail(std::string("row without a value in the column ") + (indexOf("ebn0_db") ? "ebn0_db" : "esn0_db"));
-        }
+        place(sample);
         sample.throughput = number("throughput", 0, 1000);
         sample.ber = number("ber", 0, 1);
         sample.berLow = number("ber_low", 0, 1);
@@ -211,6 +209,44 @@ private:
         checkBounds("ber", sample.ber, sample.berLow, sample.berHigh);
         checkBounds("bler", sample.bler, sample.blerLow, sample.blerHigh);
         return sample;
+    }
+
+    /// Puts the sample on the axis of the pictures, from the other one if need be.
+    void place(Sample& sample) const
+    {
+        const bool isOnEsn0 = itsAxis == simulation::Axis::esn0;
+        double& own = isOnEsn0 ? sample.esn0 : sample.ebn0;
+        double& other = isOnEsn0 ? sample.ebn0 : sample.esn0;
+        if (std::isnan(own) && std::isnan(other)) {
+            fail(std::string("row without a value in the column ") + (indexOf("ebn0_db") ? "ebn0_db" : "esn0_db"));
+        }
+        if (std::isnan(own)) {
+            const double perSymbol = 10 * std::log10(bitsPerSymbol());
+            own = isOnEsn0 ? other + perSymbol : other - perSymbol;
+        }
+        if (!std::isfinite(own)) {
+            fail(std::string("row without ") + (isOnEsn0 ? "Es/N0" : "Eb/N0") +
+                 ", over which curves are drawn here; it could be computed with block_size, or with "
+                 "transport_block_size, coded_bits and modulation");
+        }
+        if (!isOnEsn0) {
+            other = unknown;
+        }
+    }
+
+    /// Information bits of a symbol, if the row tells what is sent; otherwise unknown.
+    double bitsPerSymbol() const
+    {
+        simulation::LinkFormat format;
+        format.transportBlockSize = static_cast<unsigned>(count("transport_block_size", UINT32_MAX));
+        format.codedBits = static_cast<unsigned>(count("coded_bits", UINT32_MAX));
+        const std::string name = text("modulation");
+        const auto modulation =
+            name.empty() && format.transportBlockSize == 0 ? link::Modulation::bpsk : link::modulationOf(name);
+        format.modulation = modulation.value_or(link::Modulation::bpsk);
+        const unsigned K = blockSize();
+        const bool isKnown = modulation && (format.hasTransportBlocks() ? format.codedBits > 0 : K > 0);
+        return isKnown ? simulation::bitsPerSymbolOf(format, K) : unknown;
     }
 
     /// An unknown value matches anything.
@@ -297,6 +333,7 @@ private:
     }
 
     std::string itsName;
+    simulation::Axis itsAxis;
     std::istringstream itsText;
     base::LineReader itsLines;
     base::CsvReader itsRow{itsLines};
@@ -307,9 +344,9 @@ private:
 
 }  // namespace
 
-std::vector<Curve> readReference(const std::string& fileName)
+std::vector<Curve> readReference(const std::string& fileName, simulation::Axis axis)
 {
-    return ReferenceReader(fileName).read();
+    return ReferenceReader(fileName, axis).read();
 }
 
 }  // namespace morvik::report

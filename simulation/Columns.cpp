@@ -4,12 +4,14 @@
 #include <algorithm>
 #include <charconv>
 #include <cstdint>
+#include <cstdlib>
 #include <iterator>
 #include <optional>
 
 #include "Possible.h"
 #include "base/Numbers.h"
 #include "base/Thousandths.h"
+#include "link/channel/Decibels.h"
 #include "link/coding/CodeBlocks.h"
 #include "rules/BlockSizes.h"
 
@@ -138,6 +140,16 @@ bool readVersions(std::string_view text, ResultRow& row)
     return versions.size() <= mostTransmissions;
 }
 
+std::string codeBlocksText(const ResultRow& row)
+{
+    return std::to_string(codeBlocksOf(row.point));
+}
+
+std::string transmissionsText(const ResultRow& row)
+{
+    return std::to_string(std::max<std::size_t>(row.point.link.versions.size(), 1));
+}
+
 bool readSoftBufferBits(std::string_view text, ResultRow& row)
 {
     return readUpTo(16, text, row.point.link.softBufferBits) && row.point.link.softBufferBits != 1;
@@ -166,7 +178,8 @@ const std::vector<Column> allColumns = {
     {"transport_block_size", number,
      [](const Row& row) { return std::to_string(row.point.link.transportBlockSize); },
      readTransportBlockSize, true},
-    {"code_blocks", number, [](const Row& row) { return std::to_string(codeBlocksOf(row.point)); }, skip, true},
+    {"code_blocks", number, codeBlocksText,
+     [](Text field, Row& row) { return field == codeBlocksText(row); }, true},
     {"coded_bits", number,
      [](const Row& row) { return std::to_string(row.point.link.codedBits); },
      [](Text field, Row& row) { return readNumber(field, row.point.link.codedBits); }, true},
@@ -177,9 +190,8 @@ const std::vector<Column> allColumns = {
     {"redundancy_versions", list,
      [](const Row& row) { return versionsText(row.point.link.versions, ' '); },
      readVersions, true},
-    {"transmissions", number,
-     [](const Row& row) { return std::to_string(std::max<std::size_t>(row.point.link.versions.size(), 1)); },
-     skip, true},
+    {"transmissions", number, transmissionsText,
+     [](Text field, Row& row) { return field == transmissionsText(row); }, true},
     {"soft_buffer_bits", number,
      [](const Row& row) { return std::to_string(row.point.link.softBufferBits); },
      readSoftBufferBits, true},
@@ -271,6 +283,39 @@ const std::vector<Column> allColumns = {
 };
 // clang-format on
 
+/// Whether transport blocks can be sent like this.
+bool isSent(const LinkFormat& format)
+{
+    const unsigned perSymbol = bitsPerSymbol(format.modulation);
+    return !format.versions.empty() && format.codedBits % perSymbol == 0 &&
+           format.codedBits / perSymbol >= link::codeBlocksOf(format.transportBlockSize).count;
+}
+
+/// Whether any number of resource blocks has this transport block.
+bool isOfMcs(const LinkFormat& format)
+{
+    const link::Mcs mcs = mcsOf(format.mcs->table, format.mcs->index);
+    bool found = false;
+    for (unsigned pairs = 1; pairs <= link::mostResourceBlocks && !found; ++pairs) {
+        found = link::transportBlockSize(mcs.sizeIndex, pairs) == format.transportBlockSize &&
+                format.codedBits % (pairs * mcs.bitsPerSymbol) == 0;
+    }
+    return found && bitsPerSymbol(format.modulation) == mcs.bitsPerSymbol;
+}
+
+/// Whether a point that has been read says the same on both axes, as far as it tells the other one.
+bool agreesOnBothAxes(Point& point)
+{
+    const int ebn0 = point.milliDecibels;
+    const int esn0 = point.milliEsn0;
+    if (std::abs(ebn0) > link::mostMilliDecibels || std::abs(esn0) > link::mostMilliDecibels) {
+        return false;
+    }
+    setPlace(point, point.axis == Axis::esn0 ? esn0 : ebn0);
+    const bool isTold = isWide(point) || esn0 != 0;
+    return point.milliDecibels == ebn0 && (!isTold || milliEsn0Of(point) == esn0);
+}
+
 }  // namespace
 
 bool isVersion(std::string_view version)
@@ -293,18 +338,23 @@ const std::vector<Column>& columns(bool isWide)
     return isWide ? allColumns : narrow;
 }
 
-bool complete(ResultRow& row)
+std::string contradictionIn(ResultRow& row)
 {
     Point& point = row.point;
-    if (!point.link.hasTransportBlocks()) {
-        // Such rows say what follows from the others.
-        row.errors.reception = {};
-        point.milliEsn0 = point.link.isPlainBpsk() ? 0 : point.milliEsn0;
-        return point.link.codedBits == 0 && !point.link.mcs && point.link.versions.empty() && !point.link.stopsEarly;
+    const LinkFormat& format = point.link;
+    if (!format.hasTransportBlocks()) {
+        row.errors.reception = {};  // such rows say what follows from the others
+        if (format.codedBits != 0 || format.mcs || !format.versions.empty() || format.stopsEarly) {
+            return "transport_block_size is 0, but not what belongs to transport blocks";
+        }
+    } else if (!isSent(format)) {
+        return "transport_block_size, coded_bits, modulation and redundancy_versions do not go together";
+    } else if (point.blockSize != link::codeBlocksOf(format.transportBlockSize).sizePlus) {
+        return "block_size is not that of the code blocks of transport_block_size";
+    } else if (format.mcs && !isOfMcs(format)) {
+        return "mcs does not have this transport_block_size, coded_bits and modulation";
     }
-    const link::CodeBlocks blocks = link::codeBlocksOf(point.link.transportBlockSize);
-    return point.blockSize == blocks.sizePlus && !point.link.versions.empty() &&
-           point.link.codedBits >= blocks.count * bitsPerSymbol(point.link.modulation);
+    return agreesOnBothAxes(point) ? "" : "ebn0_db and esn0_db are not of one signal-to-noise ratio";
 }
 
 }  // namespace morvik::simulation

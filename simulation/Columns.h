@@ -28,8 +28,9 @@ bool isVersion(std::string_view version);
 /// reader; reading recomputes them.
 const std::vector<Column>& columns(bool isWide);
 
-/// Completes a row that has been read: what follows from its columns. False if they contradict each other.
-bool complete(ResultRow& row);
+/// Completes a row that has been read: what follows from its columns. Returns what in it contradicts the rest; nothing
+/// if all goes together.
+std::string contradictionIn(ResultRow& row);
 
 }  // namespace morvik::simulation
 

@@ -1,11 +1,14 @@
-// LinkWords: how blocks are sent and received, in words for tables and legends.
+// LinkWords: how blocks are sent and received, in words for tables, legends and messages.
 #include "LinkWords.h"
 
-namespace morvik {
+#include "base/Text.h"
+#include "base/Thousandths.h"
 
-std::string sentText(const simulation::Point& point)
+namespace morvik::simulation {
+
+std::string sentText(const Point& point)
 {
-    const simulation::LinkFormat& link = point.link;
+    const LinkFormat& link = point.link;
     if (!link.hasTransportBlocks()) {
         return shortSentText(point);
     }
@@ -13,9 +16,9 @@ std::string sentText(const simulation::Point& point)
            ", G = " + std::to_string(link.codedBits) + ", " + std::string(nameOf(link.modulation));
 }
 
-std::string shortSentText(const simulation::Point& point)
+std::string shortSentText(const Point& point)
 {
-    const simulation::LinkFormat& link = point.link;
+    const LinkFormat& link = point.link;
     if (link.mcs) {
         return "MCS " + mcsText(link.mcs);
     }
@@ -26,13 +29,13 @@ std::string shortSentText(const simulation::Point& point)
     return link.isPlainBpsk() ? size : size + ", " + std::string(nameOf(link.modulation));
 }
 
-std::string receivedText(const simulation::LinkFormat& link)
+std::string receivedText(const LinkFormat& link)
 {
     std::string text;
     const auto append = [&text](bool isTold, const std::string& words) {
         text += isTold ? ", " + words : "";
     };
-    const std::string versions = simulation::versionsText(link.versions, ',');
+    const std::string versions = versionsText(link.versions, ',');
     append(link.fading != link::Fading::none, std::string(nameOf(link.fading)));
     append(link.demapper != link::Demapper::maxLog, std::string(nameOf(link.demapper)) + " demapper");
     append(link.versions.size() > 1, "versions " + versions);
@@ -43,4 +46,17 @@ std::string receivedText(const simulation::LinkFormat& link)
     return text;
 }
 
-}  // namespace morvik
+std::string curveText(const Point& point)
+{
+    return sentText(point) + receivedText(point.link) + ", " + std::to_string(point.numPu) + " units, " +
+           algorithmName(point.algorithm) + ", scale " + scaleOptionText(point.scaleOption) + ", " +
+           base::counted(point.iterations, "iteration");
+}
+
+std::string placeText(const Point& point)
+{
+    const std::string axis = point.axis == Axis::ebn0 ? "Eb/N0 " : "Es/N0 ";
+    return axis + base::thousandthsText(placeOf(point)) + " dB";
+}
+
+}  // namespace morvik::simulation

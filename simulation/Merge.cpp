@@ -6,9 +6,9 @@
 #include <optional>
 #include <utility>
 
+#include "LinkWords.h"
 #include "Possible.h"
 #include "base/Error.h"
-#include "base/Thousandths.h"
 
 namespace morvik::simulation {
 
@@ -22,9 +22,7 @@ struct JoinedRow {
 
 std::string nameOf(const Point& point)
 {
-    return "K = " + std::to_string(point.blockSize) + ", " + std::to_string(point.numPu) + " units, " +
-           algorithmName(point.algorithm) + ", scale " + base::thousandthsText(point.milliScale) + ", " +
-           std::to_string(point.iterations) + " iterations, " + base::thousandthsText(point.milliDecibels) + " dB";
+    return curveText(point) + ", " + placeText(point);
 }
 
 /// What all rows of a run share.

@@ -36,6 +36,15 @@ std::vector<int> range(int start, int step, int stop)
     return values;
 }
 
+/// Shannon's limit for the bits of a symbol: the Es/N0 2^bits - 1, in thousandths of a decibel. A real symbol, BPSK,
+/// uses half the dimensions.
+int milliLimitOf(double bits, bool isReal)
+{
+    const int dimensions = isReal ? 2 : 1;
+    const auto exponent = static_cast<int>(std::lround(3010.3 * bits * dimensions));
+    return link::milliDecibelsOf((link::ratioOf(exponent) - 1) / dimensions);
+}
+
 std::vector<int> milliDecibelsOf(const Sweep& sweep, const LinkFormat& format, unsigned K)
 {
     if (!sweep.milliDecibels.empty()) {
@@ -52,15 +61,10 @@ std::vector<unsigned> blockSizesOf(const Sweep& sweep, const LinkFormat& format)
                                        : sweep.blockSizes;
 }
 
-/// Completes a point of a curve at a place on the axis: the other axis and the scale.
-Point pointAt(Point point, int milliDecibels, bool isOnEsn0)
+/// A point of a curve at a place on its axis, with its scale.
+Point pointAt(Point point, int milliDecibels)
 {
-    const double bitsPerSymbol = bitsPerSymbolOf(point.link, point.blockSize);
-    const double ratio = link::ratioOf(milliDecibels);
-    point.milliDecibels = isOnEsn0 ? link::milliDecibelsOf(ratio / bitsPerSymbol) : milliDecibels;
-    if (!point.link.isPlainBpsk()) {
-        point.milliEsn0 = isOnEsn0 ? milliDecibels : link::milliDecibelsOf(ratio * bitsPerSymbol);
-    }
+    setPlace(point, milliDecibels);
     point.milliScale = point.scaleOption ? *point.scaleOption : automaticMilliScale(point);
     return point;
 }
@@ -78,7 +82,7 @@ void appendPoints(const Sweep& sweep, const LinkFormat& format, unsigned K, std:
                     Point point = {K, numPu, algorithm, scale, 0, iterations, 0, format, Axis::ebn0, 0};
                     point.axis = isOnEsn0 ? Axis::esn0 : Axis::ebn0;
                     for (const int milliDecibels : places) {
-                        points.push_back(pointAt(point, milliDecibels, isOnEsn0));
+                        points.push_back(pointAt(point, milliDecibels));
                     }
                 }
             }
@@ -163,22 +167,23 @@ std::vector<int> usualMilliDecibels(unsigned K)
 
 std::vector<int> usualMilliEsn0(const LinkFormat& format, unsigned K)
 {
-    // Shannon's limit for the bits of a symbol, 2^r - 1, of which BPSK uses half the dimensions.
-    const double perSymbol = bitsPerSymbolOf(format, K);
-    const bool isReal = format.modulation == link::Modulation::bpsk;
-    const auto exponent = static_cast<int>(std::lround(3010.3 * perSymbol * (isReal ? 2 : 1)));
-    const double limit = (link::ratioOf(exponent) - 1) / (isReal ? 2 : 1);
     constexpr int step = 500;
-    const int start = (link::milliDecibelsOf(limit) / step + 1) * step;
+    constexpr int last = 50000;  // that options take
+    const double perSymbol = bitsPerSymbolOf(format, K);
+    const double together = perSymbol / static_cast<double>(std::max<std::size_t>(format.versions.size(), 1));
+    const bool isReal = format.modulation == link::Modulation::bpsk;
+    const int start = (milliLimitOf(together, isReal) / step + 1) * step;
+    const int above = (milliLimitOf(perSymbol, isReal) / step + 1) * step;
+    // Where blocks of 40 bits, and those of rate 0.95, are below the error rate that ends a curve.
     switch (format.fading) {
     case link::Fading::none:
         break;
     case link::Fading::symbol:
-        return range(start, step, start + 20 * step);
+        return range(start, step, std::min(above + 26000, last));
     case link::Fading::constant:
-        return range(start, 4 * step, start + 60 * step);
+        return range(start, 4 * step, std::min(above + 46000, last));
     }
-    return range(start, step, start + 12 * step);
+    return range(start, step, std::min(above + 16000, last));
 }
 
 std::uint64_t countOfPoints(const Sweep& sweep)
@@ -263,6 +268,21 @@ std::size_t nextPoint(const Plan& plan, const std::vector<PointResult>& earlier)
         ++point;
     }
     return point;
+}
+
+std::vector<PointResult> unfallenEnds(const Plan& plan, const std::vector<PointResult>& points, double most)
+{
+    std::vector<PointResult> ends;
+    for (std::size_t i = 0; i < points.size(); ++i) {
+        const bool isEnd =
+            i + 1 == points.size() || !onSameCurve(plan.points[points[i].number], plan.points[points[i + 1].number]);
+        const Tally& tally = points[i].tally;
+        const auto blockErrors = static_cast<double>(tally.errors.back().blockErrors);
+        if (isEnd && blockErrors > most * static_cast<double>(tally.blocks)) {
+            ends.push_back(points[i]);
+        }
+    }
+    return ends;
 }
 
 Results resultsOf(const Plan& plan, const std::vector<PointResult>& points)

@@ -31,7 +31,8 @@ struct Sweep {
 /// The Eb/N0 values over which the error rates of K-bit blocks fall, in thousandths of a decibel.
 std::vector<int> usualMilliDecibels(unsigned K);
 
-/// The Es/N0 values over which the error rates of what is sent in this format fall, in thousandths of a decibel.
+/// The Es/N0 values over which the error rates of what is sent in this format fall, in thousandths of a decibel: from
+/// Shannon's limit for all transmissions together, to where a single one has been received for long on this channel.
 std::vector<int> usualMilliEsn0(const LinkFormat& format, unsigned K);
 
 /// The number of points of a sweep.
@@ -81,6 +82,9 @@ bool isCurveEnded(const Plan& plan, std::size_t point, const std::vector<PointRe
 
 /// The first point after `earlier` whose curve has not ended; the number of points if there is none.
 std::size_t nextPoint(const Plan& plan, const std::vector<PointResult>& earlier);
+
+/// The last points of curves whose block error rates are still above `most` there. Points are in plan order.
+std::vector<PointResult> unfallenEnds(const Plan& plan, const std::vector<PointResult>& points, double most);
 
 /// The rows of all points.
 Results resultsOf(const Plan& plan, const std::vector<PointResult>& points);

@@ -56,10 +56,15 @@ unsigned codeBlocksOf(const Point& point)
 
 std::uint64_t countedBitsOf(const Point& point)
 {
-    if (!point.link.hasTransportBlocks()) {
-        return point.blockSize;
+    return countedBitsOf(point.link, point.blockSize);
+}
+
+std::uint64_t countedBitsOf(const LinkFormat& format, unsigned blockSize)
+{
+    if (!format.hasTransportBlocks()) {
+        return blockSize;
     }
-    const link::CodeBlocks blocks = link::codeBlocksOf(point.link.transportBlockSize);
+    const link::CodeBlocks blocks = link::codeBlocksOf(format.transportBlockSize);
     return std::uint64_t{blocks.bits} + link::crcBits + std::uint64_t{blocks.count} * blocks.ownCrcBits();
 }
 
@@ -95,6 +100,22 @@ int milliEsn0Of(const Point& point)
         return point.milliEsn0;
     }
     return link::milliDecibelsOf(link::ratioOf(point.milliDecibels) * bitsPerSymbolOf(point.link, point.blockSize));
+}
+
+void setPlace(Point& point, int milliDecibels)
+{
+    const double bitsPerSymbol = bitsPerSymbolOf(point.link, point.blockSize);
+    const double ratio = link::ratioOf(milliDecibels);
+    const bool isOnEsn0 = point.axis == Axis::esn0;
+    point.milliDecibels = isOnEsn0 ? link::milliDecibelsOf(ratio / bitsPerSymbol) : milliDecibels;
+    point.milliEsn0 = point.link.isPlainBpsk() ? 0
+                      : isOnEsn0               ? milliDecibels
+                                               : link::milliDecibelsOf(ratio * bitsPerSymbol);
+}
+
+int placeOf(const Point& point)
+{
+    return point.axis == Axis::ebn0 ? point.milliDecibels : milliEsn0Of(point);
 }
 
 double automaticScale(const Point& point, unsigned transmission)

@@ -47,7 +47,8 @@ bool onSameCurve(const Point& a, const Point& b);
 /// Sizes of what the point decodes.
 unsigned codeBlocksOf(const Point& point);        // of a block
 std::uint64_t countedBitsOf(const Point& point);  // that can be wrong in a block: with its CRCs, without filler bits
-std::uint64_t softValuesOf(const Point& point);   // that the decoder receives for a block and transmission
+std::uint64_t countedBitsOf(const LinkFormat& format, unsigned blockSize);
+std::uint64_t softValuesOf(const Point& point);  // that the decoder receives for a block and transmission
 
 /// Symbols of one transmission.
 std::uint64_t symbolsOf(const LinkFormat& link, unsigned blockSize);
@@ -57,6 +58,12 @@ double bitsPerSymbolOf(const LinkFormat& link, unsigned blockSize);
 
 /// The point's Es/N0 in thousandths of a decibel, of every kind of point.
 int milliEsn0Of(const Point& point);
+
+/// Puts a point on its axis, in thousandths of a decibel, and so on the other one.
+void setPlace(Point& point, int milliDecibels);
+
+/// Where the point is along its axis, in thousandths of a decibel.
+int placeOf(const Point& point);
 
 /// The scale that suits a transmission of a point that is not plain code blocks over BPSK and Gaussian noise: the soft
 /// value for a log-likelihood ratio of 1.

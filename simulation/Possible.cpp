@@ -5,6 +5,8 @@
 #include <functional>
 #include <vector>
 
+#include "base/Text.h"
+
 namespace morvik::simulation {
 
 namespace {
@@ -33,25 +35,24 @@ std::optional<std::string> impossibleReception(std::uint64_t blocks, const Point
 {
     const Reception& reception = errors.reception;
     const std::uint64_t codeBlocks = codeBlocksOf(point);
-    const std::string ofBlocks = std::to_string(blocks) + " blocks of " + std::to_string(codeBlocks) + " code blocks";
+    const std::string ofBlocks = base::counted(blocks, "block") + " of " + base::counted(codeBlocks, "code block");
     if (reception.transmissions < blocks || isMoreThan(reception.transmissions, blocks, point.link.versions.size())) {
         return cannotBe("sent_transmissions", reception.transmissions, ofBlocks);
     }
     const std::uint64_t decodings = reception.transmissions * codeBlocks;
     const std::uint64_t least = point.link.stopsEarly ? 1 : point.iterations;
     if (reception.iterations / least < decodings || isMoreThan(reception.iterations, decodings, point.iterations)) {
-        return cannotBe("run_iterations", reception.iterations, std::to_string(decodings) + " decoded code blocks");
+        return cannotBe("run_iterations", reception.iterations, base::counted(decodings, "decoded code block"));
     }
     if (reception.codeBlockErrors < errors.blockErrors ||
         isMoreThan(reception.codeBlockErrors, errors.blockErrors, codeBlocks)) {
         return cannotBe(
             "code_block_errors",
             reception.codeBlockErrors,
-            std::to_string(errors.blockErrors) + " wrong blocks of " + std::to_string(codeBlocks) + " code blocks");
+            base::counted(errors.blockErrors, "wrong block") + " of " + base::counted(codeBlocks, "code block"));
     }
     if (reception.undetected > errors.blockErrors) {
-        return cannotBe(
-            "undetected_errors", reception.undetected, std::to_string(errors.blockErrors) + " wrong blocks");
+        return cannotBe("undetected_errors", reception.undetected, base::counted(errors.blockErrors, "wrong block"));
     }
     return std::nullopt;
 }
@@ -69,9 +70,9 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
         return cannotBe("blocks", blocks, std::to_string(mostBlocks) + " at most");
     }
     const std::string wrongBlocks =
-        std::to_string(errors.blockErrors) + " wrong blocks of " + std::to_string(K) + " bits";
+        base::counted(errors.blockErrors, "wrong block") + " of " + std::to_string(K) + " bits";
     if (errors.blockErrors > blocks) {
-        return cannotBe("block_errors", errors.blockErrors, std::to_string(blocks) + " blocks");
+        return cannotBe("block_errors", errors.blockErrors, base::counted(blocks, "block"));
     }
     if (errors.bitErrors < errors.blockErrors || isMoreThan(errors.bitErrors, errors.blockErrors, K)) {
         return cannotBe("bit_errors", errors.bitErrors, wrongBlocks);
@@ -79,7 +80,7 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
     // A square is odd if its number is, so the two sums have the same parity.
     if (errors.bitErrorSquares < errors.bitErrors || errors.bitErrorSquares / K > errors.bitErrors ||
         errors.bitErrorSquares % 2 != errors.bitErrors % 2) {
-        return cannotBe("bit_error_squares", errors.bitErrorSquares, std::to_string(errors.bitErrors) + " wrong bits");
+        return cannotBe("bit_error_squares", errors.bitErrorSquares, base::counted(errors.bitErrors, "wrong bit"));
     }
     if (point.link.hasTransportBlocks()) {
         if (auto impossible = impossibleReception(blocks, point, errors)) {
@@ -89,7 +90,7 @@ std::optional<std::string> impossibleCount(const FrameSet& frames,
     const std::uint64_t received = point.link.hasTransportBlocks() ? errors.reception.transmissions : blocks;
     if (isMoreThan(clipped, received, softValuesOf(point))) {
         return cannotBe(
-            "clipped_values", clipped, std::to_string(blocks) + " blocks of " + std::to_string(K) + " bits");
+            "clipped_values", clipped, base::counted(blocks, "block") + " of " + std::to_string(K) + " bits");
     }
     if (!areFailures(errors.failures, frames, errors.blockErrors)) {
         return "failed_frames cannot be the first of " + wrongBlocks + " in these frames";

@@ -52,8 +52,9 @@ void readField(const Column& column, const std::string& text, ResultRow& row, co
 /// computed.
 void checkRow(ResultRow& row, const std::string& place)
 {
-    if (!complete(row)) {
-        throw base::Error(place + ": transport_block_size, coded_bits and what belongs to them contradict each other");
+    const std::string contradiction = contradictionIn(row);
+    if (!contradiction.empty()) {
+        throw base::Error(place + ": " + contradiction);
     }
     if (const auto wrong = impossibleCount(row.frames, row.point, row.errors, row.clipped)) {
         throw base::Error(place + ": " + *wrong);

@@ -10,6 +10,7 @@
 #include "ResultFiles.h"
 #include "base/Error.h"
 #include "base/Json.h"
+#include "base/Text.h"
 
 namespace morvik::simulation {
 
@@ -160,8 +161,16 @@ PointResult resultOf(const Plan& plan, std::size_t number, const Rows& rows)
     return result;
 }
 
-/// The finished points; nothing unless the results are those of a complete run of all points.
-std::optional<std::vector<PointResult>> pointsOfComplete(const Plan& plan, const Results& results)
+/// Whether the results are those of a run that has counted these points, and no others. Comparing texts catches what
+/// the points do not hold, such as the seed or other rows.
+bool areResultsOf(const Plan& plan, const std::vector<PointResult>& points, const Results& results)
+{
+    return csvText(resultsOf(plan, points)) == csvText(results);
+}
+
+/// The points of a run that ends with these results, or has been stopped with them: then the last ones have no blocks.
+/// Nothing if the results are not of this run.
+std::optional<std::vector<PointResult>> pointsOf(const Plan& plan, const Results& results)
 {
     Rows rows;
     for (const ResultRow& row : results.rows) {
@@ -170,12 +179,15 @@ std::optional<std::vector<PointResult>> pointsOfComplete(const Plan& plan, const
     std::vector<PointResult> points;
     for (std::size_t next = 0; next < plan.points.size(); next = nextPoint(plan, points)) {
         points.push_back(resultOf(plan, next, rows));
+        if (points.back().tally.blocks == 0) {
+            break;
+        }
     }
-    // Comparing texts catches what the points do not hold, such as the seed or other rows.
-    const bool isWhole =
-        std::all_of(points.begin(), points.end(), [](const PointResult& point) { return point.tally.blocks > 0; }) &&
-        csvText(resultsOf(plan, points)) == csvText(results);
-    return isWhole ? std::optional(points) : std::nullopt;
+    std::vector<PointResult> counted = points;
+    if (!counted.empty() && counted.back().tally.blocks == 0) {
+        counted.pop_back();
+    }
+    return areResultsOf(plan, counted, results) ? std::optional(points) : std::nullopt;
 }
 
 /// Why the command of a result file, if it is that of a run, prevents resuming it.
@@ -206,10 +218,15 @@ Standing standingOf(const Plan& plan, const Checkpoint& checkpoint, const std::s
 Standing standingOf(const Plan& plan, const Results& results, const std::string& fileName)
 {
     const std::string obstacle = obstacleIn(results.command, plan);
-    const auto points = pointsOfComplete(plan, results);
+    const auto points = pointsOf(plan, results);
     if (!obstacle.empty() || !points) {
         throw base::Error(fileName + ": holds other results" + (obstacle.empty() ? "" : " (" + obstacle + ')') +
                           ", and there is no checkpoint to resume; --overwrite starts anew");
+    }
+    if (!points->empty() && points->back().tally.blocks == 0) {
+        throw base::Error(
+            fileName + ": holds " + base::counted(points->size() - 1, "point") +
+            " of this run, which was stopped, but its checkpoint is lost or empty; --overwrite starts anew");
     }
     FrameSimulator simulator(plan, "");
     for (const PointResult& point : *points) {

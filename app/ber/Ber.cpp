@@ -21,6 +21,7 @@
 #include "base/Text.h"
 #include "hardware/testbench/Decoder.h"
 #include "simulation/Journal.h"
+#include "simulation/LinkWords.h"
 #include "simulation/Replay.h"
 #include "simulation/Run.h"
 #include "simulation/ThreadWorkers.h"
@@ -80,6 +81,38 @@ void checkInstructionSet(const std::string& name)
     throw base::Error(message);
 }
 
+void warnOfRates(const BerMeans& means, const simulation::Plan& plan)
+{
+    std::vector<simulation::LinkFormat> formats;
+    for (const simulation::Point& point : plan.points) {
+        if (formats.empty() || !(formats.back() == point.link)) {
+            formats.push_back(point.link);
+        }
+    }
+    const std::string warning = highRateWarning(formats);
+    if (!warning.empty()) {
+        notice(means.command + ": " + warning);
+    }
+}
+
+/// Tells which curves have not fallen over the range of Es/N0 or Eb/N0 that was chosen for them.
+void tellUnfallen(const BerMeans& means,
+                  const simulation::Plan& plan,
+                  const std::vector<simulation::PointResult>& ended)
+{
+    constexpr double most = 0.01;
+    const std::vector<simulation::PointResult> ends = unfallenEnds(plan, ended, most);
+    if (ends.empty()) {
+        return;
+    }
+    const simulation::Tally& tally = ends.front().tally;
+    const simulation::Point& point = plan.points[ends.front().number];
+    const double rate = static_cast<double>(tally.errors.back().blockErrors) / static_cast<double>(tally.blocks);
+    notice(means.command + ": " + (ends.size() > 1 ? base::counted(ends.size(), "curve") + " end" : "a curve ends") +
+           " at a block error rate above 0.01: " + base::numberText(rate, std::chars_format::general, 2) + " at " +
+           placeText(point) + ", " + curveText(point) + "; --esn0 or --ebn0 sets the range");
+}
+
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
 {
     using simulation::Journal;
@@ -89,10 +122,12 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
                     options.resume      ? Journal::Earlier::resume
                     : options.overwrite ? Journal::Earlier::overwrite
                                         : Journal::Earlier::refuse);
-    const Pictures pictures(options.pictures, options.output, {});
+    Pictures pictures(options.pictures, options.output, {});
+    pictures.takeAxis(axisOf(plan.points));
     if (options.resume && journal.isEmpty()) {
         notice(means.command + ": nothing to resume, starts from the beginning");
     }
+    warnOfRates(means, plan);
     bool isComplete = false;
     {
         const auto workers = means.makeWorkers(options, plan);
@@ -107,6 +142,9 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
         pictures.draw(resultsOf(plan, journal.ended()), points);
     }
     if (isComplete) {
+        if (options.sweep.milliDecibels.empty()) {
+            tellUnfallen(means, plan, journal.ended());
+        }
         return success;
     }
     notice(means.command + ": interrupted" +

@@ -2,18 +2,25 @@
 #include "LinkFormats.h"
 
 #include <algorithm>
-#include <stdexcept>
+#include <charconv>
 
+#include "app/TransportFit.h"
 #include "base/Error.h"
+#include "base/Numbers.h"
 #include "base/Thousandths.h"
 #include "link/coding/CodeBlocks.h"
-#include "link/coding/TransportBlock.h"
+#include "simulation/Point.h"
 
 namespace morvik {
 
 namespace {
 
 using simulation::LinkFormat;
+
+std::string rateText(double rate)
+{
+    return base::numberText(rate, std::chars_format::fixed, 3);
+}
 
 /// An option that only transport blocks have, as given, or empty.
 std::string transportOption(const LinkOptions& options)
@@ -71,72 +78,91 @@ void checkTogether(const LinkOptions& options, bool hasBlockSize)
     }
 }
 
-/// Whether a soft buffer has room for a bit of each code block.
-bool fitsBuffer(const LinkFormat& format, unsigned softBufferSize)
+/// The code rate of a transmission, with CRCs as information.
+double effectiveRate(const LinkFormat& format)
 {
-    try {
-        const link::TransportBlockCode code(
-            {format.transportBlockSize, format.codedBits, bitsPerSymbol(format.modulation), 1, softBufferSize});
-        return code.softSize() > 0;
-    } catch (const std::invalid_argument&) {
-        return false;
+    return static_cast<double>(countedBitsOf(format, 0)) / format.codedBits;
+}
+
+/// The fewest coded bits of each transmission whose sum is no less than what they are to tell.
+std::uint64_t leastCodedBits(const LinkFormat& format)
+{
+    const std::uint64_t perSymbol = bitsPerSymbol(format.modulation);
+    const std::uint64_t together = perSymbol * format.versions.size();
+    return (countedBitsOf(format, 0) + together - 1) / together * perSymbol;
+}
+
+/// Throws base::Error where nothing could be decoded, since all transmissions together have fewer bits than they are
+/// to tell. `what` is wrong then, and `least` what would fit.
+void checkRate(const LinkFormat& format, const std::string& what, const std::string& least)
+{
+    if (format.codedBits >= leastCodedBits(format)) {
+        return;
     }
+    const auto transmissions = format.versions.size();
+    throw base::Error(what + ": the code rate with CRCs is " +
+                      rateText(effectiveRate(format) / static_cast<double>(transmissions)) +
+                      (transmissions > 1 ? " after " + std::to_string(transmissions) + " transmissions" : "") +
+                      ", above 1; " + least);
 }
 
 /// Throws base::Error if a transport block cannot be sent like this.
-void checkFormat(const LinkFormat& format, const std::string& size)
+void checkFormat(const LinkFormat& format, const std::string& block)
 {
-    const unsigned perSymbol = bitsPerSymbol(format.modulation);
-    const unsigned blocks = link::codeBlocksOf(format.transportBlockSize).count;
-    const unsigned G = format.codedBits;
-    if (G % perSymbol != 0) {
-        const unsigned below = G / perSymbol * perSymbol;
-        throw base::Error("--coded-bits " + std::to_string(G) + " is no multiple of the " + std::to_string(perSymbol) +
-                          " bits of --modulation " + std::string(nameOf(format.modulation)) + ", the nearest are " +
-                          (below > 0 ? std::to_string(below) + " and " : "") + std::to_string(below + perSymbol));
-    }
-    if (G < blocks * perSymbol || G > mostCodedBits) {
-        throw base::Error(size + ": " + std::to_string(G) + " coded bits cannot be, its " + std::to_string(blocks) +
-                          " code blocks take " + std::to_string(blocks * perSymbol) + " to " +
-                          std::to_string(mostCodedBits) + " with --modulation " +
-                          std::string(nameOf(format.modulation)));
-    }
-    if (format.softBufferSize > 0 && !fitsBuffer(format, format.softBufferSize)) {
-        unsigned tooSmall = format.softBufferSize;
-        unsigned large = UINT32_MAX - 1;
-        while (tooSmall + 1 < large) {
-            const unsigned middle = tooSmall + (large - tooSmall) / 2;
-            (fitsBuffer(format, middle) ? large : tooSmall) = middle;
-        }
-        throw base::Error("--soft-buffer-size " + std::to_string(format.softBufferSize) + " is too small for " + size +
-                          ", the least that holds a bit of each of its " + std::to_string(blocks) + " code blocks is " +
-                          std::to_string(large));
-    }
+    checkFit({format.transportBlockSize, format.codedBits, format.modulation, format.softBufferSize}, block);
 }
 
 /// Whole symbols that meet a rate in thousandths most closely; at least one for each code block.
-unsigned codedBitsAt(unsigned size, int rate, unsigned perSymbol)
+std::uint64_t codedBitsAt(unsigned size, int rate, unsigned perSymbol)
 {
     const std::uint64_t thousandths = std::uint64_t{static_cast<unsigned>(rate)} * perSymbol;
     const std::uint64_t symbols = (std::uint64_t{size} * 2000 / thousandths + 1) / 2;
-    const std::uint64_t least = link::codeBlocksOf(size).count;
-    return static_cast<unsigned>(std::min<std::uint64_t>(std::max(symbols, least) * perSymbol, UINT32_MAX));
+    return std::max<std::uint64_t>(symbols, link::codeBlocksOf(size).count) * perSymbol;
+}
+
+LinkFormat formatOfCodedBits(LinkFormat format, unsigned codedBits, const std::string& block)
+{
+    format.codedBits = codedBits;
+    checkFit({format.transportBlockSize, codedBits, format.modulation, 0}, block);
+    checkRate(format,
+              "--coded-bits " + std::to_string(codedBits) + " is too small for " + block,
+              "expected " + std::to_string(leastCodedBits(format)) + " or more");
+    return format;
+}
+
+LinkFormat formatOfRate(LinkFormat format, int rate, const std::string& block)
+{
+    const unsigned A = format.transportBlockSize;
+    const std::string given = "--code-rate " + base::thousandthsText(rate);
+    const auto thousandths = [A](std::uint64_t codedBits) {
+        return std::uint64_t{A} * 1000 / codedBits;
+    };
+    const std::uint64_t codedBits = codedBitsAt(A, rate, bitsPerSymbol(format.modulation));
+    if (codedBits > mostCodedBits) {
+        throw base::Error(given + " is too low for " + block + ": a transmission has up to " +
+                          std::to_string(mostCodedBits) + " coded bits, expected " +
+                          base::thousandthsText(static_cast<int>(thousandths(mostCodedBits)) + 1) + " or more");
+    }
+    format.codedBits = static_cast<unsigned>(codedBits);
+    const std::uint64_t highest = std::min<std::uint64_t>(thousandths(leastCodedBits(format)), 1000);
+    checkRate(format,
+              given + " is too high for " + block,
+              "expected " + base::thousandthsText(static_cast<int>(highest)) + " or less");
+    return format;
 }
 
 /// Appends the formats of transport blocks of A bits, of which `format` has the rest.
 void appendSizes(const LinkOptions& options, unsigned A, LinkFormat format, std::vector<LinkFormat>& formats)
 {
-    const std::string size = "--transport-block-size " + std::to_string(A);
+    const std::string block = "--transport-block-size " + std::to_string(A);
     format.transportBlockSize = A;
     for (const unsigned codedBits : options.codedBits) {
-        format.codedBits = codedBits;
-        checkFormat(format, size);
-        formats.push_back(format);
+        formats.push_back(formatOfCodedBits(format, codedBits, block));
+        checkFormat(formats.back(), block);
     }
     for (const int rate : options.codeRates) {
-        format.codedBits = codedBitsAt(A, rate, bitsPerSymbol(format.modulation));
-        checkFormat(format, size + " --code-rate " + base::thousandthsText(rate));
-        formats.push_back(format);
+        formats.push_back(formatOfRate(format, rate, block));
+        checkFormat(formats.back(), block);
     }
 }
 
@@ -152,13 +178,18 @@ LinkFormat formatOf(const LinkOptions& options, unsigned index, LinkFormat forma
     const link::McsTable table = options.mcsTable.value_or(link::McsTable::qam64);
     const link::Mcs mcs = mcsOf(table, index);
     const unsigned pairs = *options.resourceBlocks;
+    const unsigned elements = options.resourceElements.value_or(usualResourceElements);
     format.mcs = {table, index};
     format.modulation = modulationOf(mcs);
     format.transportBlockSize = link::transportBlockSize(mcs.sizeIndex, pairs);
-    format.codedBits = pairs * options.resourceElements.value_or(usualResourceElements) * mcs.bitsPerSymbol;
-    checkFormat(format,
-                "--mcs " + std::to_string(index) + ", transport blocks of " +
-                    std::to_string(format.transportBlockSize) + " bits");
+    format.codedBits = pairs * elements * mcs.bitsPerSymbol;
+    const std::string block = "--mcs " + std::to_string(index) + ", transport blocks of " +
+                              std::to_string(format.transportBlockSize) + " bits";
+    const unsigned ofPairs = pairs * mcs.bitsPerSymbol;
+    checkRate(format,
+              "--resource-elements " + std::to_string(elements) + " is too small for " + block,
+              "expected " + std::to_string((leastCodedBits(format) + ofPairs - 1) / ofPairs) + " or more");
+    checkFormat(format, block);
     return format;
 }
 
@@ -192,6 +223,27 @@ std::vector<LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize)
         }
     }
     return formats;
+}
+
+std::string highRateWarning(const std::vector<LinkFormat>& formats)
+{
+    constexpr double skipped = 0.931;
+    const auto isHigh = [](const LinkFormat& format) {
+        return format.hasTransportBlocks() && effectiveRate(format) > skipped;
+    };
+    const auto count = static_cast<std::uint64_t>(std::count_if(formats.begin(), formats.end(), isHigh));
+    if (count == 0) {
+        return "";
+    }
+    const LinkFormat& highest = *std::max_element(formats.begin(), formats.end(), [](const auto& a, const auto& b) {
+        return effectiveRate(a) < effectiveRate(b);
+    });
+    return "the code rate with CRCs is " + rateText(effectiveRate(highest)) + " for " +
+           (highest.mcs
+                ? "MCS " + mcsText(highest.mcs)
+                : "A = " + std::to_string(highest.transportBlockSize) + ", G = " + std::to_string(highest.codedBits)) +
+           (count > 1 ? ", the highest of " + std::to_string(count) + " above 0.931" : "") +
+           ": above 0.931, a terminal may leave out decoding (3GPP TS 36.213, 7.1.7)";
 }
 
 }  // namespace morvik

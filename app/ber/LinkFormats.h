@@ -3,13 +3,13 @@
 #define MORVIK_APP_BER_LINKFORMATS_H
 
 #include <optional>
+#include <string>
 #include <vector>
 
 #include "simulation/LinkFormat.h"
 
 namespace morvik {
 
-constexpr unsigned mostCodedBits = 1U << 23;
 constexpr unsigned usualResourceElements = 120;  // of the 168 of a pair, without control and reference signals
 
 /// The options given; empty where the default depends on other options.
@@ -38,6 +38,10 @@ struct LinkOptions {
 /// What every combination of the options sends. `hasBlockSize`: plain code blocks are asked for. Throws base::Error for
 /// options that contradict each other or cannot be met.
 std::vector<simulation::LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize);
+
+/// A line for the options whose code rate is above that at which a terminal may leave out decoding (3GPP TS 36.213,
+/// 7.1.7): how many formats have it, and the highest. Empty if none has.
+std::string highRateWarning(const std::vector<simulation::LinkFormat>& formats);
 
 }  // namespace morvik
 

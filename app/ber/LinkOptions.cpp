@@ -6,6 +6,8 @@
 
 #include "Arguments.h"
 #include "Lists.h"
+#include "TransportFit.h"
+#include "TransportOptions.h"
 #include "base/Error.h"
 #include "base/Numbers.h"
 #include "base/Thousandths.h"
@@ -68,10 +70,10 @@ std::vector<unsigned> parseVersions(const std::string& text)
 {
     std::vector<unsigned> versions;
     for (const std::string& part : splitAt(',', text)) {
-        integersOf("--redundancy-versions", 0, link::redundancyVersions - 1)(part, versions);
+        integersOf(versionsOption, 0, link::redundancyVersions - 1)(part, versions);
     }
     if (versions.size() > simulation::mostTransmissions) {
-        refuse("--redundancy-versions",
+        refuse(versionsOption,
                text,
                "there are " + std::to_string(simulation::mostTransmissions) + " transmissions at most");
     }
@@ -184,13 +186,10 @@ void addLinkOptions(CLI::App& command, LinkOptions& options)
                   "bpsk, qpsk, 16qam, 64qam or 256qam; by default qpsk for transport blocks, bpsk for code blocks")
         ->check(offer({"bpsk", "qpsk", "16qam", "64qam", "256qam"}))
         ->type_name("NAME[,NAME...]");
-    command
-        .add_option_function<std::string>(
-            "--redundancy-versions",
-            [&options](const std::string& text) { options.versions = parseVersions(text); },
-            "Of each transmission, in this order; the next one is sent only where a CRC failed")
-        ->type_name("V[,V...]")
-        ->default_str("0");
+    addVersionsOption(
+        command,
+        [&options](const std::string& text) { options.versions = parseVersions(text); },
+        "Of each transmission, in this order; the next one is sent only where a CRC failed");
     addInteger(command,
                "--soft-buffer-bits",
                options.softBufferBits,

@@ -11,12 +11,12 @@
 #include <stdexcept>
 #include <string_view>
 
-#include "LinkWords.h"
 #include "base/Error.h"
 #include "base/Numbers.h"
 #include "base/Text.h"
 #include "base/Thousandths.h"
 #include "simulation/Confidence.h"
+#include "simulation/LinkWords.h"
 #include "simulation/Results.h"
 #include "simulation/StopRules.h"
 
@@ -92,12 +92,6 @@ std::string headLine(bool eachIteration, const Point& point)
     return line.text();
 }
 
-/// Along the axis, in thousandths of a decibel.
-int placeOf(const Point& point)
-{
-    return point.axis == simulation::Axis::ebn0 ? point.milliDecibels : milliEsn0Of(point);
-}
-
 Line lineOf(const ResultRow& row, bool eachIteration)
 {
     const std::uint64_t blocks = row.frames.size();
@@ -122,13 +116,6 @@ Line lineOf(const ResultRow& row, bool eachIteration)
     line.speed = row.seconds > 0 ? std::to_string(std::lround(static_cast<double>(blocks) / row.seconds)) : "";
     line.time = timeText(row.seconds);
     return line;
-}
-
-std::string curveText(const Point& point)
-{
-    return sentText(point) + receivedText(point.link) + ", " + std::to_string(point.numPu) + " units, " +
-           simulation::algorithmName(point.algorithm) + ", scale " + simulation::scaleOptionText(point.scaleOption) +
-           ", " + base::counted(point.iterations, "iteration");
 }
 
 std::string timeLeft(const Plan& plan, const PointResult& point)
@@ -194,7 +181,8 @@ void LiveTable::writeHeading(const Point& point)
         return;
     }
     eraseMovingLine();
-    write((itsHeading ? "\n" : "") + curveText(point) + '\n' + headLine(itsPlan.eachIteration, point) + '\n');
+    write((itsHeading ? "\n" : "") + simulation::curveText(point) + '\n' + headLine(itsPlan.eachIteration, point) +
+          '\n');
     itsHeading = point;
 }
 

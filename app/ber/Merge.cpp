@@ -41,14 +41,25 @@ std::string countOfPoints(const simulation::Results& results)
     return std::to_string(numbers.size());
 }
 
+std::vector<simulation::Point> pointsOf(const simulation::Results& results)
+{
+    std::vector<simulation::Point> points;
+    points.reserve(results.rows.size());
+    for (const simulation::ResultRow& row : results.rows) {
+        points.push_back(row.point);
+    }
+    return points;
+}
+
 int merge(const Options& options)
 {
-    const Pictures pictures(options.pictures, options.output, options.inputs);
+    Pictures pictures(options.pictures, options.output, options.inputs);
     std::vector<simulation::Part> parts;
     for (const std::string& input : options.inputs) {
         parts.push_back({input, simulation::readResults(input)});
     }
     const simulation::Results results = simulation::merge(parts);
+    pictures.takeAxis(axisOf(pointsOf(results)));
     if (options.pictures.isAskedFor() && results.rows.empty()) {
         throw base::Error("there are no points to draw");
     }

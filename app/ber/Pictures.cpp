@@ -5,13 +5,13 @@
 #include <iterator>
 #include <utility>
 
-#include "LinkWords.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
 #include "base/Thousandths.h"
 #include "report/Page.h"
 #include "report/Plot.h"
 #include "report/Reference.h"
+#include "simulation/LinkWords.h"
 
 namespace morvik {
 
@@ -19,7 +19,7 @@ namespace {
 
 constexpr const char* title = "Error rates";
 
-report::Row rowOf(const simulation::ResultRow& row)
+report::Row rowOf(const simulation::ResultRow& row, simulation::Axis axis)
 {
     const simulation::Point& point = row.point;
     const simulation::Bounds bits = bitErrorBounds(row);
@@ -34,7 +34,7 @@ report::Row rowOf(const simulation::ResultRow& row)
                      receivedText(point.link)};
     report::Sample& sample = drawn.sample;
     sample.ebn0 = point.milliDecibels / 1000.0;
-    if (point.axis == simulation::Axis::esn0) {
+    if (axis == simulation::Axis::esn0) {
         sample.esn0 = milliEsn0Of(point) / 1000.0;
     }
     sample.ber = bitErrorRate(row);
@@ -59,9 +59,9 @@ report::Row rowOf(const simulation::ResultRow& row)
 }
 
 /// The parameter of the axis and its range.
-std::pair<std::string, std::string> rangeOf(const std::vector<simulation::ResultRow>& rows)
+std::pair<std::string, std::string> rangeOf(const std::vector<simulation::ResultRow>& rows, simulation::Axis axis)
 {
-    const bool isEsn0 = rows.front().point.axis == simulation::Axis::esn0;
+    const bool isEsn0 = axis == simulation::Axis::esn0;
     const auto place = [isEsn0](const simulation::ResultRow& row) {
         return isEsn0 ? milliEsn0Of(row.point) : row.point.milliDecibels;
     };
@@ -104,16 +104,20 @@ void addPictureOptions(CLI::App& command, PictureOptions& options)
         ->allow_extra_args(false);
 }
 
+simulation::Axis axisOf(const std::vector<simulation::Point>& points)
+{
+    const bool isOnEsn0 = std::any_of(points.begin(), points.end(), [](const simulation::Point& point) {
+        return point.axis == simulation::Axis::esn0;
+    });
+    return isOnEsn0 ? simulation::Axis::esn0 : simulation::Axis::ebn0;
+}
+
 Pictures::Pictures(const PictureOptions& options, const std::string& output, std::vector<std::string> inputs)
     : itsOptions(options)
 {
     inputs.insert(inputs.end(), options.references.begin(), options.references.end());
     for (const std::string& file : {output, options.plot, options.report, std::string(base::standardStream)}) {
         base::expectOwnFile(file, inputs, "results");
-    }
-    for (const std::string& file : options.references) {
-        std::vector<report::Curve> curves = report::readReference(file);
-        std::move(curves.begin(), curves.end(), std::back_inserter(itsReferences));
     }
     if (!options.plot.empty()) {
         report::checkPlot(options.plot);
@@ -126,12 +130,21 @@ Pictures::Pictures(const PictureOptions& options, const std::string& output, std
     checkDistinct(options.report, options.plot);
 }
 
+void Pictures::takeAxis(simulation::Axis axis)
+{
+    itsAxis = axis;
+    for (const std::string& file : itsOptions.references) {
+        std::vector<report::Curve> curves = report::readReference(file, axis);
+        std::move(curves.begin(), curves.end(), std::back_inserter(itsReferences));
+    }
+}
+
 void Pictures::draw(const simulation::Results& results, const std::string& points) const
 {
     std::vector<report::Row> rows;
     rows.reserve(results.rows.size());
     for (const simulation::ResultRow& row : results.rows) {
-        rows.push_back(rowOf(row));
+        rows.push_back(rowOf(row, itsAxis));
     }
     std::vector<report::Curve> curves = curvesOf(rows);
     curves.insert(curves.end(), itsReferences.begin(), itsReferences.end());
@@ -143,7 +156,7 @@ void Pictures::draw(const simulation::Results& results, const std::string& point
                             curves,
                             {title,
                              {{"Channel", channelText(results.rows)},
-                              rangeOf(results.rows),
+                              rangeOf(results.rows, itsAxis),
                               {"Points", points},
                               {"Seed", std::to_string(results.rows.front().seed)},
                               {"Version", results.version}},

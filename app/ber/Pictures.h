@@ -27,18 +27,25 @@ struct PictureOptions {
 /// Adds --plot, --report and --reference, which set `options`.
 void addPictureOptions(CLI::App& command, PictureOptions& options);
 
+/// The axis of pictures: Es/N0 if any of the points is on it.
+simulation::Axis axisOf(const std::vector<simulation::Point>& points);
+
 /// Draws results as a plot and a report.
 class Pictures {
 public:
-    /// Reads the references and checks, before a long run, that the files can be written and differ from each other,
-    /// from `output`, if there is one, and from the inputs. Throws base::Error.
+    /// Checks, before a long run, that the files can be written and differ from each other, from `output`, if there is
+    /// one, and from the inputs. Throws base::Error.
     Pictures(const PictureOptions& options, const std::string& output, std::vector<std::string> inputs);
+
+    /// Reads the references, for curves over this axis. Throws base::Error.
+    void takeAxis(simulation::Axis axis);
 
     /// Draws the results, at least one. `points` describes their number. Throws base::Error.
     void draw(const simulation::Results& results, const std::string& points) const;
 
 private:
     PictureOptions itsOptions;
+    simulation::Axis itsAxis = simulation::Axis::ebn0;
     std::vector<report::Curve> itsReferences;
 };
 

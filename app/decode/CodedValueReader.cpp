@@ -56,8 +56,9 @@ void CodedValueReader::readRow()
         const std::string_view field = itsRow.fields()[i + 1];
         const auto value = base::parseNumber<double>(field);
         if (!value || !(std::abs(*value) <= static_cast<double>(std::numeric_limits<float>::max()))) {
-            itsLines.fail("column " + std::to_string(i + 2) + ": " + base::shown(field) +
-                          " is not allowed, expected a finite number");
+            itsLines.fail(
+                "column " + std::to_string(i + 2) + ": " + base::shown(field) +
+                " is not allowed, expected a decimal number in the range of a float, such as 4, -0.5 or 1e-3");
         }
         itsValues[i] = static_cast<float>(*value);
     }

@@ -36,7 +36,8 @@ public:
     Reception(const TransportDecodeOptions& options, base::OutputFile& output)
         : itsOptions(options),
           itsOutput(output),
-          itsReceiver(transportBlockCode(options.bits, options.transport),
+          itsReceiver(transportBlockCode(
+                          options.bits, options.transport, "--transport-block-size " + std::to_string(options.bits)),
                       options.decoder,
                       {options.scale, options.softBufferBits},
                       output.isStandardOutput() ? std::cerr : std::cout)
@@ -61,7 +62,7 @@ public:
         }
         const std::vector<unsigned>& versions = itsOptions.transport.versions;
         if (itsTransmissions == versions.size()) {
-            row.fail("block " + itsLabel + " has more rows than --redundancy-version has numbers, " +
+            row.fail("block " + itsLabel + " has more rows than " + versionsOption + " has numbers, " +
                      std::to_string(versions.size()));
         }
         // A receiver whose CRC fits has no use for another transmission.
@@ -161,7 +162,7 @@ std::string textOf(const Summary& summary, const TransportDecodeOptions& options
 void expectTwoFiles(const std::string& crcFile, const std::string& output)
 {
     const bool standard = crcFile == base::standardStream || output == base::standardStream;
-    if (crcFile == output || (!crcFile.empty() && !standard && base::isSamePlace(crcFile, output))) {
+    if (standard ? crcFile == output : !crcFile.empty() && base::isSamePlace(crcFile, output)) {
         throw base::Error("--crc " + crcFile + ": the decisions go there, --output names another place for them");
     }
 }

@@ -20,15 +20,12 @@ TransportFormat checked(const TransportFormat& format, const CodeBlocks& blocks)
                                     std::to_string(format.layers) + " layers, expected 1 to 8 bits on 1 to 4");
     }
     if (format.codedBits % perSymbol != 0) {
-        const unsigned below = format.codedBits / perSymbol * perSymbol;
-        throw std::invalid_argument(std::to_string(format.codedBits) + " coded bits are no multiple of the " +
-                                    std::to_string(perSymbol) + " bits of a symbol, " + std::to_string(below) +
-                                    " and " + std::to_string(below + perSymbol) + " are");
+        throw std::invalid_argument("coded bits are a multiple of the " + std::to_string(perSymbol) +
+                                    " of a symbol, not " + std::to_string(format.codedBits));
     }
     if (format.codedBits / perSymbol < blocks.count) {
-        throw std::invalid_argument(std::to_string(format.codedBits) + " coded bits are too few for " +
-                                    std::to_string(blocks.count) + " code blocks, which take " +
-                                    std::to_string(blocks.count * perSymbol) + " or more");
+        throw std::invalid_argument("coded bits are at least " + std::to_string(blocks.count * perSymbol) +
+                                    ", a symbol for each code block, not " + std::to_string(format.codedBits));
     }
     return format;
 }

@@ -134,25 +134,28 @@ TEST_F(BerLink, SendsPlainCodeBlocksOverAnyModulation)
 TEST_F(BerLink, TakesSizesFromAnMcs)
 {
     const std::vector<CsvRow> rows =
-        csvRows(berFile(words("--mcs 0:1,28 --resource-blocks 3 --resource-elements 100 --esn0 30 --max-blocks 1")));
+        csvRows(berFile(words("--mcs 0:1,28 --resource-blocks 3 --resource-elements 138 --esn0 30 --max-blocks 1")));
     ASSERT_EQ(rows.size(), 3U);
     EXPECT_EQ(rows[0].at("mcs"), "64qam 0");
     EXPECT_EQ(rows[1].at("transport_block_size"), "88");
-    EXPECT_EQ(rows[1].at("coded_bits"), "600");
+    EXPECT_EQ(rows[1].at("coded_bits"), "828");
     EXPECT_EQ(rows[2].at("mcs"), "64qam 28");
     EXPECT_EQ(rows[2].at("modulation"), "64qam");
     EXPECT_EQ(rows[2].at("transport_block_size"), "2216");
     const CsvRow high =
-        csvRows(berFile(words("--mcs 27 --mcs-table 256qam --resource-blocks 1 --esn0 40 --max-blocks 1"))).at(0);
+        csvRows(
+            berFile(words(
+                "--mcs 27 --mcs-table 256qam --resource-blocks 1 --resource-elements 138 --esn0 40 --max-blocks 1")))
+            .at(0);
     EXPECT_EQ(high.at("mcs"), "256qam 27");
     EXPECT_EQ(high.at("transport_block_size"), "968");
-    EXPECT_EQ(high.at("coded_bits"), "960");
+    EXPECT_EQ(high.at("coded_bits"), "1104");
 }
 
 TEST_F(BerLink, HoldsTheCommandThatRepeatsTheRun)
 {
     const std::string arguments =
-        "--transport-block-size 40,100 --coded-bits 120,240 --modulation bpsk,16qam --redundancy-versions 0,2,3,1 "
+        "--transport-block-size 40,100 --coded-bits 160,240 --modulation bpsk,16qam --redundancy-versions 0,2,3,1 "
         "--soft-buffer-bits 7 --soft-buffer-size 300 --channel block-rayleigh --demapper exact --early-stop crc "
         "--num-pu "
         "4 --algorithm table --scale 3 --iterations 5 --esn0 10:1:12";
@@ -208,19 +211,93 @@ TEST_F(BerLink, RefusesWhatCannotBeSent)
     expectError("--transport-block-size 1000 --coded-bits 1501",
                 "--coded-bits 1501 is no multiple of the 2 bits of --modulation qpsk, the nearest are 1500 and 1502");
     expectError("--transport-block-size 1000 --coded-bits 3 --modulation 16qam",
-                "--coded-bits 3 is no multiple of the 4 bits of --modulation 16qam, the nearest are 4");
+                "--coded-bits 3 is no multiple of the 4 bits of --modulation 16qam, the least is 4");
     expectError("--transport-block-size 20000 --coded-bits 12 --modulation 64qam",
-                "--transport-block-size 20000: 12 coded bits cannot be, its 4 code blocks take 24 to 8388608 with "
-                "--modulation 64qam");
-    expectError(
-        "--transport-block-size 1000000 --code-rate 0.1",
-        "--transport-block-size 1000000 --code-rate 0.1: 10000000 coded bits cannot be, its 164 code blocks take "
-        "328 to 8388608 with --modulation qpsk");
-    expectError(
-        "--mcs 27 --mcs-table 256qam --resource-blocks 100 --resource-elements 1 --esn0 1 --max-blocks 1 "
-        "--soft-buffer-size 1",
-        "--soft-buffer-size 1 is too small for --mcs 27, transport blocks of 97896 bits, the least that holds a bit of "
-        "each of its 16 code blocks is 32");
+                "--coded-bits 12 is too small for --transport-block-size 20000, whose 4 code blocks take 24 or more "
+                "with --modulation 64qam");
+    expectError("--transport-block-size 1000000 --code-rate 0.01",
+                "--code-rate 0.01 is too low for --transport-block-size 1000000: a transmission has up to 67108864 "
+                "coded bits, expected 0.015 or more");
+    const std::string large = "--mcs 27 --mcs-table 256qam --resource-blocks 100 --resource-elements 130 ";
+    expectError(large + "--soft-buffer-size 1",
+                "--soft-buffer-size 1 is too small for --mcs 27, transport blocks of 97896 bits, the least that holds "
+                "a bit of each of its 16 code blocks is 32");
+    expectError("--transport-block-size 40 --coded-bits 100 --soft-buffer-size 1",
+                "--soft-buffer-size 1 is too small for --transport-block-size 40, the least that holds a bit of it is "
+                "2");
+}
+
+TEST_F(BerLink, RefusesCodeRatesAboveOne)
+{
+    expectError("--transport-block-size 1000 --coded-bits 1000",
+                "--coded-bits 1000 is too small for --transport-block-size 1000: the code rate with CRCs is 1.024, "
+                "above 1; expected 1024 or more");
+    expectError("--transport-block-size 7000 --coded-bits 3500 --redundancy-versions 0,2",
+                "--coded-bits 3500 is too small for --transport-block-size 7000: the code rate with CRCs is 1.010 "
+                "after 2 transmissions, above 1; expected 3536 or more");
+    expectError("--transport-block-size 40 --code-rate 0.9 --modulation bpsk",
+                "--code-rate 0.9 is too high for --transport-block-size 40: the code rate with CRCs is 1.455, above 1; "
+                "expected 0.625 or less");
+    expectError("--mcs 28 --resource-blocks 6 --resource-elements 120",
+                "--resource-elements 120 is too small for --mcs 28, transport blocks of 4392 bits: the code rate with "
+                "CRCs is 1.022, above 1; expected 123 or more");
+    for (const char* const fit : {"--transport-block-size 1000 --coded-bits 1024",
+                                  "--transport-block-size 7000 --coded-bits 3536 --redundancy-versions 0,2",
+                                  "--transport-block-size 40 --code-rate 0.625 --modulation bpsk",
+                                  "--mcs 28 --resource-blocks 6 --resource-elements 123"}) {
+        EXPECT_EQ(morvik.run(words("ber --esn0 0 --max-blocks 1 " + std::string(fit))).status, 0) << fit;
+    }
+}
+
+TEST_F(BerLink, TellsOfCodeRatesThatATerminalMayLeaveOut)
+{
+    const auto told = [this](const std::string& arguments) {
+        return morvik.run(words("ber " + arguments + " --max-blocks 1 --esn0 30")).err;
+    };
+    const std::string may = ": above 0.931, a terminal may leave out decoding (3GPP TS 36.213, 7.1.7)\n";
+    EXPECT_EQ(told("--transport-block-size 976 --coded-bits 1076"), "") << "0.929";
+    EXPECT_EQ(told("--transport-block-size 976 --coded-bits 1072,1000"),
+              "morvik ber: the code rate with CRCs is 1.000 for A = 976, G = 1000, the highest of 2 above 0.931" + may);
+    EXPECT_EQ(told("--mcs 27:28 --resource-blocks 6 --resource-elements 130"),
+              "morvik ber: the code rate with CRCs is 0.944 for MCS 64qam 28" + may);
+    EXPECT_EQ(told("--block-size 40"), "");
+}
+
+TEST_F(BerLink, TakesEitherNameOfRedundancyVersions)
+{
+    const std::string sizes = "--transport-block-size 40 --coded-bits 120 --esn0 4 --max-blocks 3 ";
+    EXPECT_EQ(berFile(words(sizes + "--redundancy-version 0,2"), "a.csv"),
+              berFile(words(sizes + "--redundancy-versions 0,2"), "b.csv"));
+    morvik.write("bits", std::string(40, '1') + '\n');
+    const std::string encode = "encode bits --transport-block --coded-bits 120 ";
+    EXPECT_EQ(morvik.run(words(encode + "--redundancy-version 0,2")).out,
+              morvik.run(words(encode + "--redundancy-versions 0,2")).out);
+}
+
+TEST_F(BerLink, GoesOnUntilTheErrorRateHasFallen)
+{
+    const std::string rules = " --block-errors 10 --max-blocks 300 --stop-bler 0.01 ";
+    for (const char* const sent : {"--transport-block-size 1000 --code-rate 0.9 --modulation 256qam",
+                                   "--transport-block-size 40 --code-rate 0.33 --modulation 256qam",
+                                   "--transport-block-size 1000 --code-rate 0.9 --channel rayleigh",
+                                   "--transport-block-size 40 --code-rate 0.33 --channel block-rayleigh",
+                                   "--transport-block-size 1000 --code-rate 0.5 --redundancy-versions 0,2,3,1",
+                                   "--block-size 40 --modulation 64qam --channel rayleigh"}) {
+        SCOPED_TRACE(sent);
+        const CommandResult result =
+            morvik.run(words(std::string("ber ") + sent + rules + "--output r.csv --overwrite"));
+        EXPECT_EQ(result.err, "");
+        const std::vector<CsvRow> rows = csvRows(morvik.read("r.csv"));
+        EXPECT_GT(std::stod(rows.front().at("bler")), 0.5) << "it begins before the fall";
+        EXPECT_LE(std::stod(rows.back().at("bler")), 0.01);
+    }
+    const CommandResult weak =
+        morvik.run(words("ber --block-size 6144 --iterations 1,8 --quiet --output weak.csv" + rules));
+    EXPECT_EQ(weak.status, 0);
+    EXPECT_EQ(weak.err,
+              "morvik ber: a curve ends at a block error rate above 0.01: 1 at Eb/N0 1.5 dB, K = 6144, 2 units, "
+              "scaled, scale auto, 1 iteration; --esn0 or --ebn0 sets the range\n");
+    EXPECT_EQ(morvik.run(words("ber --block-size 6144 --ebn0 0 --max-blocks 1")).err, "");
 }
 
 TEST_F(BerLink, RefusesOptionsThatContradictEachOther)
@@ -262,7 +339,7 @@ TEST_F(BerLink, RefusesOptionsThatContradictEachOther)
 TEST_F(BerLink, RefusesValues)
 {
     expectNotAllowed("--transport-block-size", "0", "expected an integer from 1 to 16777216");
-    expectNotAllowed("--coded-bits", "8388609", "expected an integer from 1 to 8388608");
+    expectNotAllowed("--coded-bits", "67108865", "expected an integer from 1 to 67108864");
     expectNotAllowed("--code-rate", "1.1", "expected a number above 0 and up to 1, with at most three decimals");
     expectNotAllowed("--mcs", "29", "expected 0 to 28, or FROM:TO");
     expectNotAllowed("--mcs", "5:4", "expected 0 to 28, or FROM:TO");

@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
+#include <iterator>
 #include <regex>
 #include <string>
 #include <vector>
@@ -88,6 +89,22 @@ TEST_F(BerPictures, TakeResultsOfEitherFormatAsReferences)
     EXPECT_EQ(bad.err, "morvik ber: bad.json: lacks \"version\"\n");
 }
 
+TEST_F(BerPictures, OverEitherAxisHaveAllCurves)
+{
+    berFile(words("--block-size 40 --ebn0 4,5 --max-blocks 50"), "a.csv");
+    berFile(words("--block-size 40 --modulation qpsk --esn0 1,2 --max-blocks 50"), "b.csv");
+    const auto pointsIn = [this](const std::string& arguments) {
+        EXPECT_EQ(morvik.run(words("merge " + arguments + " --output all.csv --plot all.svg")).err, "");
+        const std::string picture = morvik.read("all.svg");
+        const std::regex point("<use xlink");
+        return std::distance(std::sregex_iterator(picture.begin(), picture.end(), point), std::sregex_iterator());
+    };
+    const auto alone = pointsIn("b.csv");
+    const auto together = pointsIn("a.csv b.csv");
+    EXPECT_GT(together, alone + 2) << "and more than in the legend";
+    EXPECT_EQ(pointsIn("b.csv --reference a.csv"), together);
+}
+
 TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)
 {
     expectRefusedAtOnce("--plot curves.gif",
@@ -102,6 +119,10 @@ TEST_F(BerPictures, ThatCannotBeWrittenEndTheRunBeforeItBegins)
     morvik.write("bad.csv", "ebn0_db,ber\n0,much\n");
     expectRefusedAtOnce("--reference bad.csv",
                         "bad.csv:2: \"much\" in the column ber is not allowed, expected a number from 0 to 1");
+    morvik.write("other.csv", "esn0_db,ber\n0,0.1\n");
+    expectRefusedAtOnce("--reference other.csv",
+                        "other.csv:2: row without Eb/N0, over which curves are drawn here; it could be computed with "
+                        "block_size, or with transport_block_size, coded_bits and modulation");
 }
 
 TEST_F(BerPictures, ThatWouldTakeThePlaceOfTheResultsEndTheRunBeforeItBegins)

@@ -469,8 +469,8 @@ TEST_F(BerRuns, ThatShareFramesAreNotJoined)
     berFile(run + Arguments{"99:200"}, "b.csv");
     expectRefused(
         {"merge", "a.csv", "b.csv"},
-        "morvik merge: b.csv: has frames that a.csv has, too: K = 40, 2 units, scaled, scale 8, 8 iterations, 0 "
-        "dB, frames 99:200");
+        "morvik merge: b.csv: has frames that a.csv has, too: K = 40, 2 units, scaled, scale auto, 8 iterations, "
+        "Eb/N0 0 dB, frames 99:200");
     berFile(run + Arguments{"100:200", "--seed", "2"}, "b.csv");
     expectRefused({"merge", "a.csv", "b.csv", "--output", "c.csv"},
                   "morvik merge: b.csv: has seed 2, but a.csv has 1; only results of the same seed are joined");

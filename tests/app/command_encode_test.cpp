@@ -67,7 +67,7 @@ protected:
     {
         const CommandResult result =
             morvik.run(std::vector<std::string>{"encode", "bits"} + encodeFormat +
-                       std::vector<std::string>{"--redundancy-version", versions, "--amplitude", "8"});
+                       std::vector<std::string>{"--redundancy-versions", versions, "--amplitude", "8"});
         ASSERT_EQ(result.status, 0) << result.err;
         std::istringstream rows(result.out);
         std::string text;
@@ -142,7 +142,7 @@ TEST_F(EncodeTest, AgreesWithAnotherEncoderOfTransportBlocks)
                                                  std::to_string(vector.G),
                                                  "--modulation",
                                                  modulations[vector.Qm],
-                                                 "--redundancy-version",
+                                                 "--redundancy-versions",
                                                  std::to_string(vector.rv)});
         EXPECT_EQ(result.status, 0) << result.err;
         EXPECT_TRUE(result.out == textOf(vector.coded) + '\n') << vector.A << ' ' << vector.G;
@@ -155,14 +155,18 @@ TEST_F(EncodeTest, RefusesWhatCannotBeEncoded)
     expectRefused({"encode", "bits"}, "morvik encode: bits:1: 41 bits, expected a block size of 3GPP TS 36.212");
     expectRefused({"encode", "bits", "--transport-block"}, "morvik encode: --transport-block requires --coded-bits");
     expectRefused({"encode", "bits", "--coded-bits", "100"}, "morvik encode: --coded-bits requires --transport-block");
-    expectRefused({"encode", "bits", "--transport-block", "--coded-bits", "102", "--modulation", "16qam"},
-                  "morvik encode: bits:1: transport block of 41 bits, --coded-bits 102, --modulation 16qam: 102 coded "
-                  "bits are no multiple of the 4 bits of a symbol, 100 and 104 are\n");
-    expectRefused({"encode", "bits", "--transport-block", "--coded-bits", "100", "--soft-buffer-size", "1"},
-                  "morvik encode: bits:1: transport block of 41 bits, --coded-bits 100, --modulation qpsk: a circular "
-                  "buffer of 1 has no bit of a block of 72\n");
-    expectRefused({"encode", "bits", "--transport-block", "--coded-bits", "100", "--redundancy-version", "0,4"},
-                  "morvik encode: --redundancy-version: \"0,4\" is not allowed, expected 0 to 3");
+    const auto expectNoFit = [this](const std::vector<std::string>& options, const std::string& message) {
+        expectRefused(std::vector<std::string>{"encode", "bits", "--transport-block", "--coded-bits"} + options,
+                      "morvik encode: bits:1: " + message + '\n');
+    };
+    expectNoFit({"102", "--modulation", "16qam"},
+                "--coded-bits 102 is no multiple of the 4 bits of --modulation 16qam, the nearest are 100 and 104");
+    expectNoFit({"1"}, "--coded-bits 1 is no multiple of the 2 bits of --modulation qpsk, the least is 2");
+    expectNoFit({"100", "--soft-buffer-size", "1"},
+                "--soft-buffer-size 1 is too small for the transport block of 41 bits, the least that holds a bit of "
+                "it is 2");
+    expectRefused({"encode", "bits", "--transport-block", "--coded-bits", "100", "--redundancy-versions", "0,4"},
+                  "morvik encode: --redundancy-versions: \"0,4\" is not allowed, expected 0 to 3");
     expectRefused({"encode", "bits", "--output", "bits"}, "morvik encode: bits: ");
     morvik.write("other", "01a\n");
     expectRefused({"encode", "other", "--transport-block", "--coded-bits", "100"},
@@ -171,15 +175,16 @@ TEST_F(EncodeTest, RefusesWhatCannotBeEncoded)
     expectRefused({"encode", "empty", "--transport-block", "--coded-bits", "100"},
                   "morvik encode: empty:1: no blocks, expected a line of 0 and 1 for each\n");
     morvik.write("large", std::string(20000, '1') + '\n');
-    expectRefused({"encode", "large", "--transport-block", "--coded-bits", "6"},
-                  "morvik encode: large:1: transport block of 20000 bits, --coded-bits 6, --modulation qpsk: 6 coded "
-                  "bits are too few for 4 code blocks, which take 8 or more\n");
+    expectRefused(
+        {"encode", "large", "--transport-block", "--coded-bits", "6"},
+        "morvik encode: large:1: --coded-bits 6 is too small for the transport block of 20000 bits, whose 4 code "
+        "blocks take 8 or more with --modulation qpsk\n");
 }
 
 TEST_F(TransportBlocksTest, AreReceived)
 {
     send("2", 0);
-    const CommandResult result = receive({"--redundancy-version", "2"});
+    const CommandResult result = receive({"--redundancy-versions", "2"});
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.out, itsBits);
     EXPECT_TRUE(morvik::support::isSummary(result.err,
@@ -204,7 +209,7 @@ TEST_F(TransportBlocksTest, AreRetransmittedUntilTheirCrcFits)
     send("0,2,3,1", 17);
     for (const std::vector<std::string>& more :
          {std::vector<std::string>{}, {"--scale", "0.5"}, {"--soft-buffer-bits", "5"}, {"--soft-buffer-bits", "16"}}) {
-        const CommandResult result = receive(more + std::vector<std::string>{"--redundancy-version", "0,2,3,1"});
+        const CommandResult result = receive(more + std::vector<std::string>{"--redundancy-versions", "0,2,3,1"});
         EXPECT_EQ(result.status, 0);
         EXPECT_EQ(result.out, itsBits);
         EXPECT_EQ(morvik.read("crc.csv"), "block,transmissions,crc,code_blocks\n0,2,1,1\n1,2,1,1\n");
@@ -215,8 +220,8 @@ TEST_F(TransportBlocksTest, OfAnotherSoftBufferAreNotUnderstood)
 {
     // The redundancy version 1 starts elsewhere in a smaller buffer.
     send("1", 0);
-    EXPECT_EQ(receive({"--redundancy-version", "1", "--soft-buffer-size", "1500"}).status, 1);
-    EXPECT_EQ(receive({"--redundancy-version", "1"}).status, 0);
+    EXPECT_EQ(receive({"--redundancy-versions", "1", "--soft-buffer-size", "1500"}).status, 1);
+    EXPECT_EQ(receive({"--redundancy-versions", "1"}).status, 0);
 }
 
 TEST_F(TransportBlocksTest, OfWrongFormAreRefused)
@@ -241,16 +246,18 @@ TEST_F(TransportBlocksTest, OfWrongFormAreRefused)
     expectText(top, "in.csv:1: no rows after the header");
     expectText(top + "x" + zeros, "in.csv:2: block \"x\" is not a label");
     expectText(top + "0,1,2\n", "in.csv:2: 2 values, expected the 1600 of --coded-bits\n");
-    for (const char* const value : {"nan", "inf", "-inf", "1e99", "", "1x"}) {
-        expectText(top + "0,1," + value + zeros.substr(4),
-                   "in.csv:2: column 3: \"" + std::string(value) + "\" is not allowed, expected a finite number\n");
+    for (const char* const value : {"nan", "inf", "-inf", "1e99", "", "1x", "+4", "0x10"}) {
+        expectText(
+            top + "0,1," + value + zeros.substr(4),
+            "in.csv:2: column 3: \"" + std::string(value) +
+                "\" is not allowed, expected a decimal number in the range of a float, such as 4, -0.5 or 1e-3\n");
     }
     expectText(top + "\n0" + zeros, "in.csv:2: blank line before the end\n");
     morvik.write("in.csv", top + "0,1e-60" + zeros.substr(2));
     EXPECT_EQ(morvik.run(decode).status, 1) << "a number too small for a float is 0, and the CRC fails";
     morvik.write("in.csv", top + "0" + zeros + "0" + zeros);
     EXPECT_EQ(morvik.run(decode).err,
-              start + "in.csv:3: block 0 has more rows than --redundancy-version has numbers, 1\n");
+              start + "in.csv:3: block 0 has more rows than --redundancy-versions has numbers, 1\n");
 }
 
 TEST_F(TransportBlocksTest, NeedOptionsThatGoTogether)
@@ -267,8 +274,10 @@ TEST_F(TransportBlocksTest, NeedOptionsThatGoTogether)
     expectRefused(decode + std::vector<std::string>{"--crc", "-"}, start + "--crc -: the decisions go there");
     expectRefused(decode + std::vector<std::string>{"--crc", "a", "--output", "a"}, start + "--crc a: the decisions");
     expectRefused(decode + std::vector<std::string>{"--crc", "bits"}, start + "bits: ");
+    expectRefused(decode + std::vector<std::string>{"--crc", "/dev/null", "--output", "/dev/null"},
+                  start + "bits:1: wrong header");
     expectRefused({"decode", "bits", "--transport-block-size", "700", "--coded-bits", "801"},
                   start +
-                      "transport block of 700 bits, --coded-bits 801, --modulation qpsk: 801 coded bits are no "
-                      "multiple of the 2 bits of a symbol, 800 and 802 are\n");
+                      "--coded-bits 801 is no multiple of the 2 bits of --modulation qpsk, the nearest are 800 and "
+                      "802\n");
 }

@@ -154,6 +154,7 @@ TEST_F(OutputFile, IsTheSamePlaceUnderAllOfItsNames)
         EXPECT_FALSE(isSamePlace(file, folder.path("sub/file.csv")));
         folder.write("file.csv", "");
     }
+    EXPECT_FALSE(isSamePlace("/dev/null", "/dev/null")) << "nothing is kept there";
 }
 
 TEST_F(OutputFile, ComparesThePlaceOfAPipe)

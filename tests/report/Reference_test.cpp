@@ -15,10 +15,11 @@ using namespace morvik::report;
 
 class Reference : public testing::Test {
 protected:
-    std::vector<Curve> read(const std::string& text) const
+    std::vector<Curve> read(const std::string& text,
+                            morvik::simulation::Axis axis = morvik::simulation::Axis::ebn0) const
     {
         itsFiles.write("rates.csv", text);
-        return readReference(path());
+        return readReference(path(), axis);
     }
 
     /// Expects a refusal in these words, after the file's name.
@@ -42,7 +43,9 @@ protected:
 
 Curve readOnly(const std::string& name)
 {
-    const auto curves = readReference(MORVIK_ERROR_RATES "/" + name + ".csv");
+    const auto curves =
+        readReference(MORVIK_ERROR_RATES "/" + name + ".csv",
+                      name.rfind("link_", 0) == 0 ? morvik::simulation::Axis::esn0 : morvik::simulation::Axis::ebn0);
     EXPECT_EQ(curves.size(), 1U);
     return curves.at(0);
 }
@@ -156,9 +159,11 @@ TEST_F(Reference, LocalesHaveNoSay)
 
 TEST_F(Reference, TakesTransportBlocksOverEsN0)
 {
+    constexpr auto esn0 = morvik::simulation::Axis::esn0;
     const auto curves = read(
         "transport_block_size,coded_bits,esn0_db,blocks,block_errors,bit_errors,bler\n"
-        "1000,1500,3.1,158,100,5655,0.6329\n1000,1500,2.5,100,100,9650,1\n");
+        "1000,1500,3.1,158,100,5655,0.6329\n1000,1500,2.5,100,100,9650,1\n",
+        esn0);
     ASSERT_EQ(curves.size(), 1U);
     EXPECT_EQ(curves[0].title, "rates: A = 1000, G = 1500");
     EXPECT_EQ(curves[0].samples.at(0).esn0, 2.5);
@@ -166,6 +171,33 @@ TEST_F(Reference, TakesTransportBlocksOverEsN0)
     EXPECT_EQ(read("mcs,esn0_db,ebn0_db,throughput,bler\n64qam 3,1,2,0.5,0\n").at(0).title, "rates: MCS 64qam 3");
     EXPECT_EQ(read("block_size,modulation,ebn0_db,bler\n40,16qam,2,0.5\n").at(0).title, "rates: K = 40, 16qam");
     expectRefused("esn0_db,ber\n,0.5\n", ":2: row without a value in the column esn0_db");
+}
+
+TEST_F(Reference, GoesToTheAxisOfThePictures)
+{
+    constexpr auto esn0 = morvik::simulation::Axis::esn0;
+    const auto sampleOf = [this](const std::string& text, morvik::simulation::Axis axis) {
+        return read(text, axis).at(0).samples.at(0);
+    };
+    // Two thirds of a bit for each symbol of QPSK are 1.761 dB.
+    const std::string sizes = "transport_block_size,coded_bits,modulation,";
+    EXPECT_NEAR(sampleOf(sizes + "ebn0_db,ber\n1000,3000,qpsk,1,0.5\n", esn0).esn0, -0.761, 1e-3);
+    EXPECT_NEAR(
+        sampleOf(sizes + "esn0_db,ber\n1000,3000,qpsk,1,0.5\n", morvik::simulation::Axis::ebn0).ebn0, 2.761, 1e-3);
+    // 40 bits of 132 of BPSK are -5.185 dB.
+    const morvik::report::Sample plain = sampleOf("block_size,ebn0_db,ber\n40,5.185,0.5\n", esn0);
+    EXPECT_NEAR(plain.esn0, 0, 1e-3);
+    EXPECT_EQ(plain.ebn0, 5.185);
+    EXPECT_TRUE(std::isnan(sampleOf("esn0_db,ebn0_db,ber\n1,2,0.5\n", morvik::simulation::Axis::ebn0).esn0))
+        << "as of the other curves there";
+    EXPECT_EQ(sampleOf("esn0_db,ebn0_db,ber\n1,2,0.5\n", esn0).esn0, 1);
+    const std::string refused =
+        ":2: row without Eb/N0, over which curves are drawn here; it could be computed with block_size, or with "
+        "transport_block_size, coded_bits and modulation";
+    expectRefused("esn0_db,ber\n1,0.5\n", refused);
+    for (const char* const row : {"0,100,qpsk,1,0.5", "100,0,qpsk,1,0.5", "100,400,8psk,1,0.5", "100,400,,1,0.5"}) {
+        expectRefused(sizes + "esn0_db,ber\n" + row + '\n', refused);
+    }
 }
 
 TEST_F(Reference, RefusesFilesThatCannotBeRead)

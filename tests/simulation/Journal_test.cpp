@@ -139,16 +139,19 @@ TEST_F(JournalFiles, OfACompleteRunHaveNothingLeftToDo)
 TEST_F(JournalFiles, KeepOtherResultsFromAnAttemptToResume)
 {
     plan.rules.maxBlocks = 20;
-    const auto expectRefused = [this] {
+    const auto expectRefused = [this](const std::string& what =
+                                          "holds other results, and there is no checkpoint to resume") {
         const std::string before = folder.read("results.csv");
-        EXPECT_EQ(refusal(Earlier::resume),
-                  output + ": holds other results, and there is no checkpoint to resume; --overwrite starts anew");
+        EXPECT_EQ(refusal(Earlier::resume), output + ": " + what + "; --overwrite starts anew");
         EXPECT_EQ(folder.read("results.csv"), before);
         EXPECT_EQ(folder.names(), Names{"results.csv"});
     };
     const std::vector<PointResult> points = {resultOf(0, 20), resultOf(1, 20)};
     writeResults(output, resultsOf(plan, {points[0]}));
-    expectRefused();  // a part of it
+    const std::string lost = "holds 1 point of this run, which was stopped, but its checkpoint is lost or empty";
+    expectRefused(lost);
+    folder.write("results.csv.checkpoint", "");
+    expectRefused(lost);
     Plan other = plan;
     other.seed = 2;
     writeResults(output, resultsOf(other, points));

@@ -77,8 +77,22 @@ TEST(Merge, CanBeMergedAgain)
 TEST(Merge, RefusesFramesThatAreThereTwice)
 {
     EXPECT_EQ(refusal({partOf("a.csv", {exampleRow(0, 0, {0, 100})}), partOf("b.csv", {exampleRow(0, 0, {99, 200})})}),
-              "b.csv: has frames that a.csv has, too: K = 40, 4 units, scaled, scale 8.125, 8 iterations, 0 dB, frames "
-              "99:200");
+              "b.csv: has frames that a.csv has, too: K = 40, 4 units, scaled, scale auto, 8 iterations, Eb/N0 0 dB, "
+              "frames 99:200");
+    const auto sent = [](FrameRange frames) {
+        ResultRow row = exampleRow(0, 0, frames);
+        row.point.link.transportBlockSize = 100;
+        row.point.link.codedBits = 400;
+        row.point.link.modulation = morvik::link::Modulation::qam16;
+        row.point.link.versions = {0, 2};
+        row.point.iterations = 1;
+        row.point.axis = Axis::esn0;
+        setPlace(row.point, 2500);
+        return row;
+    };
+    EXPECT_EQ(refusal({partOf("a.csv", {sent({0, 9})}), partOf("b.csv", {sent({8, 10})})}),
+              "b.csv: has frames that a.csv has, too: A = 100, G = 400, 16qam, versions 0,2, 4 units, scaled, scale "
+              "auto, 1 iteration, Es/N0 2.5 dB, frames 8:10");
 }
 
 TEST(Merge, RefusesAnotherSeedOrVersion)

@@ -253,4 +253,47 @@ TEST_F(ResultFiles, OfJsonBringNoLinesIntoCsv)
     }
 }
 
+/// A transport block of MCS 11 on three pairs of resource blocks.
+ResultRow sentRow()
+{
+    ResultRow row = exampleRow(0, 0, {1, 5});
+    row.point.blockSize = 528;
+    row.point.link.mcs = {morvik::link::McsTable::qam64, 11};
+    row.point.link.transportBlockSize = 504;
+    row.point.link.codedBits = 3 * 120 * 4;
+    row.point.link.modulation = morvik::link::Modulation::qam16;
+    row.point.link.versions = {0};
+    row.point.axis = Axis::esn0;
+    setPlace(row.point, 3000);
+    row.errors.reception = {0, 0, 4, 32};
+    return row;
+}
+
+TEST_F(ResultFiles, RefuseTransportBlocksThatContradictThemselves)
+{
+    const std::string text = csvText({"1.2.3", "", {sentRow()}});
+    EXPECT_EQ(refusal("a.csv", text), "none");
+    const auto with = [&text](const std::string& field, const std::string& other) {
+        std::string changed = text;
+        const std::size_t place = changed.find(',' + field + ',', changed.find('\n'));
+        EXPECT_NE(place, std::string::npos) << field;
+        return changed.replace(place + 1, field.size(), other);
+    };
+    const std::string sizes =
+        "a.csv:2: transport_block_size, coded_bits, modulation and redundancy_versions do not go together";
+    const std::string axes = "a.csv:2: ebn0_db and esn0_db are not of one signal-to-noise ratio";
+    const std::string mcs = "a.csv:2: mcs does not have this transport_block_size, coded_bits and modulation";
+    EXPECT_EQ(refusal("a.csv", with("1440", "1442")), sizes);
+    EXPECT_EQ(refusal("a.csv", with("1440", "0")), sizes);
+    EXPECT_EQ(refusal("a.csv", with("1440", "1444")), mcs) << "no multiple of three symbols";
+    EXPECT_EQ(refusal("a.csv", with("64qam 11", "64qam 9")), mcs) << "of QPSK";
+    EXPECT_EQ(refusal("a.csv", with("64qam 11", "64qam 12")), mcs) << "of another size";
+    EXPECT_EQ(refusal("a.csv", with("504,1", "504,2")), "a.csv:2: code_blocks \"2\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", with("0,1,0,0", "0,2,0,0")), "a.csv:2: transmissions \"2\" is not allowed");
+    EXPECT_EQ(refusal("a.csv", with("esn0,3", "esn0,4")), axes);
+    EXPECT_EQ(refusal("a.csv", with("esn0,3", "esn0,300")), axes);
+    EXPECT_EQ(refusal("a.csv", with("528", "512")),
+              "a.csv:2: block_size is not that of the code blocks of transport_block_size");
+}
+
 }  // namespace

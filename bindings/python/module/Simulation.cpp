@@ -13,6 +13,7 @@
 #include "Arrays.h"
 #include "Decoder.h"
 #include "ErrorRates.h"
+#include "app/TransportFit.h"
 #include "app/ber/LinkFormats.h"
 #include "base/Error.h"
 #include "base/Thousandths.h"
@@ -224,6 +225,7 @@ void addSimulation(py::module_& module)
                 sweep.axis = isOver ? simulation::Axis::esn0 : simulation::Axis::ebn0;
             });
     addLinkOptions(module);
+    module.attr("most_coded_bits") = mostCodedBits;
     py::class_<simulation::StopRules>(module, "StopRules")
         .def(py::init<>())
         .def_readwrite("block_errors", &simulation::StopRules::blockErrors)

@@ -12,6 +12,7 @@ __version__: str
 block_sizes: tuple[int, ...]
 instruction_sets: tuple[str, ...]
 default_num_pu: int
+most_coded_bits: int
 default_algorithm: int
 default_tag_width: int
 

@@ -269,7 +269,7 @@ def _link_options(
     options = _core.LinkOptions()
     size = whole("transport_block_size", 1, 2**24)
     options.transport_block_sizes = listed("transport_block_size", transport_block_size, size)
-    options.coded_bits = listed("coded_bits", coded_bits, whole("coded_bits", 1, 2**23))
+    options.coded_bits = listed("coded_bits", coded_bits, whole("coded_bits", 1, _core.most_coded_bits))
     options.code_rates = listed("code_rate", code_rate, lambda value: thousandths("code_rate", value, 0.001, 1))
     options.mcs_indices = sorted(listed("mcs", mcs, whole("mcs", 0, 28)))
     options.resource_blocks = optional("resource_blocks", resource_blocks, 1, 110)

@@ -85,6 +85,7 @@ def test_schemes_and_frames_are_those_of_the_command(repository):
         mcs=[27, 5],
         mcs_table="256qam",
         resource_blocks=4,
+        resource_elements=138,
         demapper="exact",
         soft_buffer_bits=7,
         soft_buffer_size=9000,
