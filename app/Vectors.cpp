@@ -128,8 +128,8 @@ std::vector<simulation::Point> transportOf(const Options& options)
         sweep.scaleOptions = {std::nullopt};
         sweep.iterations = {options.decoder.iterations};
         sweep.axis = options.milliEbn0 ? simulation::Axis::ebn0 : simulation::Axis::esn0;
-        const std::vector<int> usual = usualMilliEsn0(format, link::codeBlocksOf(format.transportBlockSize).sizePlus);
-        sweep.milliDecibels = {options.milliEbn0.value_or(options.milliEsn0.value_or(usual[usual.size() / 2]))};
+        const int amid = milliEsn0Amid(format, link::codeBlocksOf(format.transportBlockSize).sizePlus);
+        sweep.milliDecibels = {options.milliEbn0.value_or(options.milliEsn0.value_or(amid))};
         points.push_back(pointsOf(sweep).front());
     }
     return points;

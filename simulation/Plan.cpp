@@ -36,13 +36,16 @@ std::vector<int> range(int start, int step, int stop)
     return values;
 }
 
-/// Shannon's limit for the bits of a symbol: the Es/N0 2^bits - 1, in thousandths of a decibel. A real symbol, BPSK,
-/// uses half the dimensions.
-int milliLimitOf(double bits, bool isReal)
+constexpr int limitStep = 500;
+
+/// The first multiple of limitStep above Shannon's limit for the bits of a symbol, an Es/N0 of 2^bits - 1, in
+/// thousandths of a decibel. BPSK uses half the dimensions.
+int stepAboveLimit(const LinkFormat& format, double bits)
 {
-    const int dimensions = isReal ? 2 : 1;
+    const int dimensions = format.modulation == link::Modulation::bpsk ? 2 : 1;
     const auto exponent = static_cast<int>(std::lround(3010.3 * bits * dimensions));
-    return link::milliDecibelsOf((link::ratioOf(exponent) - 1) / dimensions);
+    const int limit = link::milliDecibelsOf((link::ratioOf(exponent) - 1) / dimensions);
+    return (limit / limitStep + 1) * limitStep;
 }
 
 std::vector<int> milliDecibelsOf(const Sweep& sweep, const LinkFormat& format, unsigned K)
@@ -167,23 +170,35 @@ std::vector<int> usualMilliDecibels(unsigned K)
 
 std::vector<int> usualMilliEsn0(const LinkFormat& format, unsigned K)
 {
-    constexpr int step = 500;
     constexpr int last = 50000;  // that options take
     const double perSymbol = bitsPerSymbolOf(format, K);
-    const double together = perSymbol / static_cast<double>(std::max<std::size_t>(format.versions.size(), 1));
-    const bool isReal = format.modulation == link::Modulation::bpsk;
-    const int start = (milliLimitOf(together, isReal) / step + 1) * step;
-    const int above = (milliLimitOf(perSymbol, isReal) / step + 1) * step;
+    const double transmissions = static_cast<double>(std::max<std::size_t>(format.versions.size(), 1));
+    const int start = stepAboveLimit(format, perSymbol / transmissions);
+    const int above = stepAboveLimit(format, perSymbol);
     // Where blocks of 40 bits, and those of rate 0.95, are below the error rate that ends a curve.
     switch (format.fading) {
     case link::Fading::none:
         break;
     case link::Fading::symbol:
-        return range(start, step, std::min(above + 26000, last));
+        return range(start, limitStep, std::min(above + 26000, last));
     case link::Fading::constant:
-        return range(start, 4 * step, std::min(above + 46000, last));
+        return range(start, 4 * limitStep, std::min(above + 46000, last));
     }
-    return range(start, step, std::min(above + 16000, last));
+    return range(start, limitStep, std::min(above + 16000, last));
+}
+
+int milliEsn0Amid(const LinkFormat& format, unsigned K)
+{
+    const int above = stepAboveLimit(format, bitsPerSymbolOf(format, K));
+    switch (format.fading) {
+    case link::Fading::none:
+        break;
+    case link::Fading::symbol:
+        return above + 5000;
+    case link::Fading::constant:
+        return above + 16000;
+    }
+    return above + 3000;
 }
 
 std::uint64_t countOfPoints(const Sweep& sweep)

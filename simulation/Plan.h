@@ -35,6 +35,9 @@ std::vector<int> usualMilliDecibels(unsigned K);
 /// Shannon's limit for all transmissions together, to where a single one has been received for long on this channel.
 std::vector<int> usualMilliEsn0(const LinkFormat& format, unsigned K);
 
+/// An Es/N0 amid the fall of the error rate of the first transmission, likewise.
+int milliEsn0Amid(const LinkFormat& format, unsigned K);
+
 /// The number of points of a sweep.
 std::uint64_t countOfPoints(const Sweep& sweep);
 
