@@ -212,12 +212,3 @@ TEST(DemapperTest, HasNames)
     EXPECT_EQ(nameOf(Demapper::exact), "exact");
     EXPECT_EQ(morvik::link::demapperOf("best"), std::nullopt);
 }
-
-TEST(DemapperTest, HasNames)
-{
-    for (const Demapper demapper : morvik::link::demappers) {
-        EXPECT_EQ(morvik::link::demapperOf(nameOf(demapper)), demapper);
-    }
-    EXPECT_EQ(nameOf(Demapper::exact), "exact");
-    EXPECT_EQ(morvik::link::demapperOf("best"), std::nullopt);
-}
