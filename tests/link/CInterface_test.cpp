@@ -433,7 +433,7 @@ TEST(LinkInterfaceTest, RatiosAreFinite)
     for (const std::uint32_t bits : {1U, 2U, 4U, 6U, 8U}) {
         for (const std::int32_t demapper : {MORVIK_LINK_MAX_LOG, MORVIK_LINK_EXACT}) {
             const Floats symbols = {0, 0.7F, -3e38F, 3e38F};
-            Floats ratios(4 / (bits == 1 ? 1 : 2) * bits);
+            Floats ratios(4 / (bits == 1 ? 1U : 2U) * bits);
             for (const float variance : {1e-45F, 1e-38F, 1.0F}) {
                 ASSERT_EQ(morvik_link_demap(
                               bits, demapper, symbols.data(), nullptr, variance, ratios.size() / bits, ratios.data()),
