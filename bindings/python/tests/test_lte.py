@@ -242,7 +242,7 @@ LLRS = np.ones(2400)
         (lambda: CHAIN.recover(LLRS.astype(int)[None, None]), ValueError, "one or two dimensions, not 3"),
         (lambda: CHAIN.soft_values(LLRS), ValueError, "buffers must have 3084 values for each block, not 2400"),
         (lambda: CHAIN.soft_values(np.zeros(3084), 0), ValueError, "scale must be a positive number"),
-        (lambda: CHAIN.soft_values(np.zeros(3084, np.int16), 8), ValueError, "scale must be None for buffers of whole"),
+        (lambda: CHAIN.soft_values(np.zeros(3084, np.int16), 8), ValueError, "scale must be None for buffers of integers"),
         (lambda: CHAIN.join([BITS, BITS]), ValueError, "decisions must have 1 code block, not 2"),
         (lambda: CHAIN.code_block(1), ValueError, "r must be in the range 0 to 0, not 1"),
         (lambda: lte.segment(2**24 + 1), ValueError, "transport_block_size must be in the range"),
