@@ -14,6 +14,7 @@ import unittest
 sys.dont_write_bytecode = True  # writes no bytecode into the tree
 from distances import Estimate, Point, crossing, paired_step, read_curves, read_reference
 import loss
+import scales
 from needed import ITERATIONS, SIMULATIONS, TYPES, needed
 from validate import DOCUMENT, RESULTS, pictures, with_tables
 
@@ -144,6 +145,14 @@ class Document(unittest.TestCase):
     def test_has_the_tables_that_the_results_give(self):
         text = DOCUMENT.read_text(encoding="utf-8")
         self.assertEqual(with_tables(text), text)
+        text = scales.DOCUMENT.read_text(encoding="utf-8")
+        self.assertEqual(scales.with_table(text, RESULTS / "scales.csv"), text)
+
+    def test_default_scales_are_within_a_few_hundredths_of_a_decibel_of_the_best(self):
+        lines = scales.lines_of(RESULTS / "scales.csv")
+        self.assertEqual(len(lines), len(scales.MODULATIONS) * len(scales.RATES))
+        for line, rows in lines.items():
+            self.assertGreater(min(scales.losses(rows)[1]), -0.03, line)
 
 
 if __name__ == "__main__":

@@ -20,6 +20,7 @@ import loss
 import needed
 from needed import ITERATIONS, division_table, needed_table
 from plot import draw
+import scales
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
 RESULTS = ROOT / "validation" / "results"
@@ -51,7 +52,7 @@ VARIANT_RUNS = {
          ["600,650,700,750", "400,450,500", "300,350,400,450"]))
     for algorithm, points in zip(("0", "1", "2"), by_algorithm)
 }
-SIMULATIONS = {**needed.SIMULATIONS, **loss.SIMULATIONS}
+SIMULATIONS = {**needed.SIMULATIONS, **loss.SIMULATIONS, **scales.SIMULATIONS}
 ALL_RUNS = [*MODEL_RUNS, *VARIANT_RUNS, *SIMULATIONS]
 
 # Results, the reference with the same number of iterations, its name in the document, and the types compared with it.
@@ -201,11 +202,13 @@ def main(arguments):
                 pool.shutdown(cancel_futures=True)
                 sys.exit(f"validate: {error}")
     DOCUMENT.write_text(with_tables(DOCUMENT.read_text(encoding="utf-8")), encoding="utf-8")
+    scale_text = scales.DOCUMENT.read_text(encoding="utf-8")
+    scales.DOCUMENT.write_text(scales.with_table(scale_text, RESULTS / "scales.csv"), encoding="utf-8")
     PLOT.write_bytes(draw([("K = {}\\n{} iterations".format(*parts_of(results)), kind, algorithm, found)
                            for results, kind, algorithm, found in distances()]))
     for name, picture in pictures(RESULTS).items():
         (PLOT.parent / name).write_bytes(picture)
-    print(f"Tables: {DOCUMENT}\nPlots:  {PLOT}, {', '.join(pictures(RESULTS))}")
+    print(f"Tables: {DOCUMENT}, {scales.DOCUMENT}\nPlots:  {PLOT}, {', '.join(pictures(RESULTS))}")
 
 
 if __name__ == "__main__":
