@@ -9,6 +9,7 @@
 #include "link/RatioScale.h"
 #include "link/channel/Decibels.h"
 #include "link/coding/CodeBlocks.h"
+#include "link/coding/TurboEncoder.h"
 #include "rules/Algorithms.h"
 #include "rules/Tail.h"
 
@@ -52,6 +53,11 @@ bool onSameCurve(const Point& a, const Point& b)
 unsigned codeBlocksOf(const Point& point)
 {
     return point.link.hasTransportBlocks() ? link::codeBlocksOf(point.link.transportBlockSize).count : 1;
+}
+
+std::uint32_t smallestBatchOf(const Point& point)
+{
+    return std::max(link::TurboEncoder::blocksAtOnce / codeBlocksOf(point), 1U);
 }
 
 std::uint64_t countedBitsOf(const Point& point)

@@ -45,8 +45,9 @@ bool operator<(const Point& a, const Point& b);
 bool onSameCurve(const Point& a, const Point& b);
 
 /// Sizes of what the point decodes.
-unsigned codeBlocksOf(const Point& point);        // of a block
-std::uint64_t countedBitsOf(const Point& point);  // that can be wrong in a block: with its CRCs, without filler bits
+unsigned codeBlocksOf(const Point& point);          // of a block
+std::uint32_t smallestBatchOf(const Point& point);  // the fewest blocks that fill the encoder
+std::uint64_t countedBitsOf(const Point& point);    // that can be wrong in a block: with its CRCs, without filler bits
 std::uint64_t countedBitsOf(const LinkFormat& format, unsigned blockSize);
 std::uint64_t softValuesOf(const Point& point);  // that the decoder receives for a block and transmission
 

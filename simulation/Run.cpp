@@ -28,7 +28,7 @@ std::uint32_t largestBatch(const Point& point)
 {
     constexpr std::uint64_t bitIterations = 1U << 22;
     const std::uint64_t of = std::uint64_t{point.blockSize} * codeBlocksOf(point) * point.iterations;
-    return std::max(static_cast<std::uint32_t>(bitIterations / of), smallestBatch);
+    return std::max(static_cast<std::uint32_t>(bitIterations / of), smallestBatchOf(point));
 }
 
 double secondsSince(Clock::time_point start)
@@ -64,6 +64,7 @@ public:
           itsSaving(saving),
           itsResult(result),
           itsCount(plan.rules, plan.frames, result.tally),
+          itsSmallestBatch(smallestBatchOf(plan.points[result.number])),
           itsLargestBatch(largestBatch(plan.points[result.number])),
           itsNext(plan.frames.from + itsResult.tally.blocks)
     {
@@ -109,9 +110,9 @@ private:
     {
         const std::uint64_t share =
             (itsNext - itsPlan.frames.from) / (std::uint64_t{2} * batchesAhead * itsParts.workers.count());
-        const std::uint64_t size = std::clamp<std::uint64_t>(share, smallestBatch, itsLargestBatch);
-        const std::uint64_t unaligned = itsNext % smallestBatch;  // if resumed within a batch
-        return static_cast<std::uint32_t>(size / smallestBatch * smallestBatch - unaligned);
+        const std::uint64_t size = std::clamp<std::uint64_t>(share, itsSmallestBatch, itsLargestBatch);
+        const std::uint64_t unaligned = itsNext % itsSmallestBatch;  // if resumed within a batch
+        return static_cast<std::uint32_t>(size / itsSmallestBatch * itsSmallestBatch - unaligned);
     }
 
     void takeResult()
@@ -143,6 +144,7 @@ private:
     Saving& itsSaving;
     PointResult itsResult;
     PointCount itsCount;
+    std::uint32_t itsSmallestBatch;
     std::uint32_t itsLargestBatch;
     std::uint64_t itsNext;       // the first frame not yet handed out
     unsigned itsBatchesOut = 0;  // handed out, not yet returned

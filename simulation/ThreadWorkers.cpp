@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <limits>
 #include <string>
 #include <system_error>
 #include <utility>
@@ -14,7 +15,11 @@ namespace morvik::simulation {
 
 ThreadWorkers::ThreadWorkers(const Plan& plan, unsigned threads, const std::string& instructionSet)
 {
-    const std::uint64_t batches = (plan.mostFrames() - 1) / smallestBatch + 1;
+    std::uint32_t batch = std::numeric_limits<std::uint32_t>::max();
+    for (const Point& point : plan.points) {
+        batch = std::min(batch, smallestBatchOf(point));
+    }
+    const std::uint64_t batches = (plan.mostFrames() - 1) / batch + 1;
     const auto useful = static_cast<unsigned>(std::min<std::uint64_t>(threads, batches));
     try {
         for (unsigned i = 0; i < useful; ++i) {

@@ -19,9 +19,6 @@ struct FrameBatch {
     std::uint32_t count = 0;
 };
 
-/// The fewest frames of a batch, if as many are left: what the encoder takes at once.
-constexpr std::uint32_t smallestBatch = 64;
-
 /// The result of a batch.
 struct BatchResult {
     FrameBatch batch;

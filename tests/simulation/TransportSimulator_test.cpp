@@ -240,6 +240,18 @@ TEST(TransportSimulator, CountsAfterEachIterationWhatDecodingAnewGives)
     expectAsDecodingAnew(format, 7500, 4);
 }
 
+TEST(TransportSimulator, BatchesOfManyCodeBlocksHaveFewFrames)
+{
+    LinkFormat format = threeBlocks();
+    EXPECT_EQ(smallestBatchOf(planOf(format, 9000).points[0]), 21U);
+    format.transportBlockSize = 97896;
+    format.codedBits = 200000;
+    EXPECT_EQ(smallestBatchOf(planOf(format, 9000).points[0]), 4U);
+    format.transportBlockSize = 1000000;
+    EXPECT_EQ(smallestBatchOf(planOf(format, 9000).points[0]), 1U);
+    EXPECT_EQ(smallestBatchOf(Point{}), 64U);
+}
+
 TEST(TransportSimulator, ResultsTravel)
 {
     LinkFormat format = threeBlocks();
