@@ -57,7 +57,8 @@ struct Group {
     static constexpr unsigned count = bits <= 2 ? 16 : 8;
     static constexpr unsigned size = count * bits;
 
-    typedef std::int32_t Words __attribute__((vector_size(4 * count)));
+    typedef std::uint32_t Words __attribute__((vector_size(4 * count)));
+    typedef std::int32_t Integers __attribute__((vector_size(4 * count)));
     typedef float Numbers __attribute__((vector_size(4 * count)));
 };
 
@@ -66,7 +67,7 @@ template <unsigned bits>
 void takePlaces(typename Group<bits>::Words& places)
 {
     for (unsigned n = 0; n < Group<bits>::count; ++n) {
-        places[n] = static_cast<std::int32_t>(n / 2 * 2 * bits + n % 2);
+        places[n] = n / 2 * 2 * bits + n % 2;
     }
 }
 
@@ -82,7 +83,8 @@ void takeMagnitudes(const typename Group<bits>::Words& numbers, typename Group<b
         const Words turned = (numbers >> 2 * (bits - i) & one) - one;
         magnitudes = (one << i) + (magnitudes ^ turned) - turned;
     }
-    taken = __builtin_convertvector(magnitudes, typename Group<bits>::Numbers);
+    taken = __builtin_convertvector(reinterpret_cast<typename Group<bits>::Integers>(magnitudes),
+                                    typename Group<bits>::Numbers);
 }
 
 /// Maps a group from bit `first` of a row on. Reads no word without a bit of its first `count` numbers.
@@ -99,7 +101,7 @@ void mapGroup(const std::uint64_t* row,
     if (64 % Group<bits>::size != 0 && first % 64 + count * bits > 64) {
         word |= row[first / 64 + 1] << (64 - first % 64);
     }
-    const Words shifted = (Words{} + static_cast<std::int32_t>(word & 0xFFFFFFFF)) >> places;
+    const Words shifted = (Words{} + static_cast<std::uint32_t>(word & 0xFFFFFFFF)) >> places;
     takeMagnitudes<bits>(shifted, mapped);
     mapped = reinterpret_cast<typename Group<bits>::Numbers>(reinterpret_cast<Words>(mapped * unit) ^ shifted << 31);
 }
