@@ -78,7 +78,7 @@ package morvik_pkg;
 
     // What the model says goes to the log, and stays to be read.
     class morvik_speaker;
-        string message;  // of the last call: all that the model said, separated by line feeds
+        string message;  // of the last call that observed no right value: all that the model said, with line feeds between
 
         protected function void add_message(string line);
             if (morvik_log == null)
@@ -232,14 +232,25 @@ package morvik_pkg;
         // Takes a value of the core, in eighths: a register's bits, sign-extended. The first difference of a block is an
         // error. Returns CHECKER_AGREES, CHECKER_DIFFERS or CHECKER_REFUSED.
         function int observe(int signal, int half_iteration, int step, logic signed [31:0] got);
-            return answered(morvik_checker_observe(handle, signal, half_iteration, step, known(got)));
+            int answer;
+            answer = morvik_checker_observe(handle, signal, half_iteration, step, $isunknown(got) ? VALUE_UNKNOWN : got);
+            if (answer != CHECKER_AGREES)
+                void'(answered(answer));
+            return answer;
         endfunction
 
         // The same for all values of SIGNAL_G, SIGNAL_ALPHA or SIGNAL_BETA.
         function int observe_row(int signal, int half_iteration, int step, metrics_t got);
-            return answered(morvik_dpi_observe_row(handle, signal, half_iteration, step,
-                known(got[0]), known(got[1]), known(got[2]), known(got[3]),
-                known(got[4]), known(got[5]), known(got[6]), known(got[7])));
+            int answer;
+            if ($isunknown({got[0], got[1], got[2], got[3], got[4], got[5], got[6], got[7]}))
+                for (int i = 0; i < 8; i++)
+                    if ($isunknown(got[i]))
+                        got[i] = VALUE_UNKNOWN;
+            answer = morvik_dpi_observe_row(handle, signal, half_iteration, step,
+                got[0], got[1], got[2], got[3], got[4], got[5], got[6], got[7]);
+            if (answer != CHECKER_AGREES)
+                void'(answered(answer));
+            return answer;
         endfunction
 
         // What the core computes, or VALUE_UNKNOWN where it computes nothing.
@@ -285,10 +296,6 @@ package morvik_pkg;
         function void destroy();
             morvik_checker_destroy(handle);
             handle = null;
-        endfunction
-
-        local function int known(logic signed [31:0] got);
-            return $isunknown(got) ? VALUE_UNKNOWN : got;
         endfunction
 
         // Passes the messages on if there may be some.

@@ -1,15 +1,17 @@
 // Checker: compares the values of a simulation with the model while they appear.
 #include "Checker.h"
 
+#include <algorithm>
+#include <cstddef>
+#include <sstream>
+#include <utility>
+
 #include "hardware/comparison/Comparison.h"
 #include "hardware/comparison/Coverage.h"
 #include "hardware/comparison/Dump.h"
 #include "hardware/comparison/NameMap.h"
 #include "hardware/comparison/Report.h"
 #include "hardware/testbench/Decoder.h"
-
-#include <algorithm>
-#include <sstream>
 
 namespace morvik::checker {
 
@@ -22,16 +24,37 @@ Checker::Checker(const veltra_ip_morvik_v1_0_generics& generics) : itsGenerics(g
 void Checker::start(const SoftBlock& block, unsigned iterations, std::ostream& warnings)
 {
     forget();
-    itsModel = comparison::computeModel(block, itsGenerics, iterations, warnings);
-    itsSeen.emplace(passes(), steps());
+    comparison::Model model = comparison::computeModel(block, itsGenerics, iterations, warnings);
+    itsPairs.resize(std::size_t{model.values.passes()} * model.values.steps() * signalCount);
+    // Nothing below fails: there is a whole block or none.
+    itsModel = std::move(model);
+    itsPasses = itsModel->values.passes();
+    itsSteps = itsModel->values.steps();
+    forAllPlaces([this](const Place& place) {
+        itsPairs[index(place)] = {itsModel->values.at(place), Values::missing};
+    });
     ++itsBlocks;
 }
 
 void Checker::forget()
 {
     itsModel.reset();
+    itsPasses = 0;
+    itsSteps = 0;
     itsCounts = {};
     itsDifferences = 0;
+}
+
+template <class Function>
+void Checker::forAllPlaces(Function function) const
+{
+    for (unsigned pass = 0; pass < itsPasses; ++pass) {
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            for (unsigned step = 0; step < itsSteps; ++step) {
+                function(Place{pass, signal, step});
+            }
+        }
+    }
 }
 
 Seen Checker::seen(unsigned signal) const
@@ -64,7 +87,7 @@ template <class Format>
 std::string Checker::formatted(Format format) const
 {
     comparison::Dump record(passes(), steps());
-    record.values = *itsSeen;
+    forAllPlaces([&](const Place& place) { record.values.set(place, itsPairs[index(place)].got); });
     for (unsigned signal = 0; signal < signalCount; ++signal) {
         record.given[signal] = itsCounts[signal] > 0;
     }

@@ -7,6 +7,7 @@
 #include <optional>
 #include <ostream>
 #include <string>
+#include <vector>
 
 #include "hardware/comparison/Model.h"
 #include "hardware/comparison/Values.h"
@@ -53,35 +54,35 @@ public:
     /// Half-iterations of the block, and its steps, the tail's included: 0 without a block.
     unsigned passes() const
     {
-        return hasBlock() ? itsModel->values.passes() : 0;
+        return itsPasses;
     }
 
     unsigned steps() const
     {
-        return hasBlock() ? itsModel->values.steps() : 0;
+        return itsSteps;
     }
 
     /// What the core computes; nothing where it computes none. The place must be one of the block.
     std::optional<std::int16_t> expected(const Place& place) const
     {
-        return itsModel->values.has(place) ? std::optional(itsModel->values.at(place)) : std::nullopt;
+        const std::int16_t wanted = itsPairs[index(place)].wanted;
+        return wanted == Values::missing ? std::nullopt : std::optional(wanted);
     }
 
     /// Takes a value, or Values::unknown, and tells whether it agrees. The place must be one of the block. Where the
     /// core computes nothing, everything agrees. Of several values observed at a place, the first wrong one stays.
     bool observe(const Place& place, std::int16_t value)
     {
-        const std::int16_t wanted = itsModel->values.at(place);
-        if (wanted == Values::missing) {
+        Pair& pair = itsPairs[index(place)];
+        if (pair.wanted == Values::missing) {
             return true;
         }
-        const std::int16_t before = itsSeen->at(place);
-        itsCounts[place.signal] += before == Values::missing ? 1U : 0U;
-        if (before == Values::missing || before == wanted) {
-            itsSeen->set(place, value);
-            itsDifferences += value == wanted ? 0U : 1U;
+        itsCounts[place.signal] += pair.got == Values::missing ? 1U : 0U;
+        if (pair.got == Values::missing || pair.got == pair.wanted) {
+            pair.got = value;
+            itsDifferences += value == pair.wanted ? 0U : 1U;
         }
-        return value == wanted;
+        return value == pair.wanted;
     }
 
     /// Places with a wrong value.
@@ -101,6 +102,22 @@ public:
     std::string report() const;
 
 private:
+    /// What the core computes at a place, and what has been observed there; or Values::missing.
+    struct Pair {
+        std::int16_t wanted;
+        std::int16_t got;
+    };
+
+    /// Those of a step are neighbours, as they are observed together.
+    std::size_t index(const Place& place) const
+    {
+        return (std::size_t{place.pass} * itsSteps + place.step) * signalCount + place.signal;
+    }
+
+    /// Calls a function with each place of the block.
+    template <class Function>
+    void forAllPlaces(Function function) const;
+
     std::string name() const;
     template <class Format>
     std::string formatted(Format format) const;
@@ -108,7 +125,9 @@ private:
     veltra_ip_morvik_v1_0_generics itsGenerics;
     std::uint64_t itsBlocks = 0;  ///< started
     std::optional<comparison::Model> itsModel;
-    std::optional<Values> itsSeen;  ///< of the model's size
+    unsigned itsPasses = 0;
+    unsigned itsSteps = 0;
+    std::vector<Pair> itsPairs;
     std::array<std::uint32_t, signalCount> itsCounts = {};
     std::uint64_t itsDifferences = 0;
 };
