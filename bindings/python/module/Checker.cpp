@@ -71,6 +71,7 @@ public:
                                          const std::vector<std::optional<std::int32_t>>& given)
     {
         std::vector<std::int32_t> values;
+        values.reserve(given.size());
         for (const auto& value : given) {
             values.push_back(value.value_or(MORVIK_CHECKER_UNKNOWN));
         }
@@ -120,7 +121,7 @@ public:
     /// Throws Refusal.
     std::string report()
     {
-        const std::string text = morvik_checker_report(itsChecker.get());
+        std::string text = morvik_checker_report(itsChecker.get());
         if (text.empty()) {
             throw Refusal(message());
         }
