@@ -21,7 +21,7 @@ exclude_patterns = ["build", ".*"]
 nitpicky = True
 nitpick_ignore_regex = [("c:identifier", "u?int(8|16|32)_t|size_t"), ("cpp:identifier", "u?int32_t")]
 
-myst_heading_anchors = 3
+myst_heading_anchors = 4
 suppress_warnings = ["myst.header"]  # pages of the site begin with what the reader sees first
 
 breathe_projects = {"morvik": str(ROOT / "build/docs/doxygen/xml")}
