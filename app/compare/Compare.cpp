@@ -1,40 +1,27 @@
 // Compare: the subcommand that finds where a hardware simulation departs from the model.
 #include "Compare.h"
 
+#include <algorithm>
 #include <iostream>
 #include <memory>
 #include <string>
 #include <vector>
 
 #include "Arguments.h"
-#include "DecoderOptions.h"
+#include "BlockCase.h"
+#include "CompareOptions.h"
+#include "DumpFiles.h"
 #include "Notice.h"
-#include "OtherRuns.h"
+#include "Regression.h"
+#include "ResultFiles.h"
 #include "SoftValueReader.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
-#include "base/UnpackedFile.h"
-#include "hardware/comparison/Comparison.h"
-#include "hardware/comparison/Coverage.h"
-#include "hardware/comparison/Dump.h"
-#include "hardware/comparison/Model.h"
-#include "hardware/comparison/NameMap.h"
-#include "hardware/comparison/Report.h"
+#include "hardware/vectors/Manifest.h"
 
 namespace morvik {
 
 namespace {
-
-struct Options {
-    std::string block;
-    std::uint32_t number = 0;
-    std::string dump;
-    std::string map;
-    std::string form;
-    bool ignoreUnknown = false;
-    bool partial = false;
-    DecoderOptions decoder;
-};
 
 comparison::NameMap readMap(const std::string& file)
 {
@@ -45,63 +32,103 @@ comparison::NameMap readMap(const std::string& file)
     return comparison::readNameMap(input.stream(), input.name());
 }
 
-bool endsIn(const std::string& name, const std::string& ending)
+/// Every file that is read and has a name of its own.
+std::vector<std::string> inputsOf(const CompareOptions& options)
 {
-    return name.size() > ending.size() && name.compare(name.size() - ending.size(), ending.size(), ending) == 0;
-}
-
-/// Whether the dump is a VCD, by the option, the content or the file name extension.
-bool isVcd(const Options& options, const base::UnpackedFile& input)
-{
-    if (options.form.empty()) {
-        return input.isFst() || endsIn(options.dump, ".vcd") || endsIn(options.dump, ".vcd.gz");
+    std::vector<std::string> files = {options.block, options.dump, options.map};
+    for (const std::string& set : options.sets) {
+        files.push_back(set + '/' + vectors::manifestName);
     }
-    return options.form == "vcd";
+    return files;
 }
 
-void readDump(const Options& options, const comparison::NameMap& map, comparison::Dump& dump)
+ComparedSet compareBlock(const CompareOptions& options, const comparison::NameMap& map)
 {
-    base::UnpackedFile input(options.dump);
-    try {
-        if (isVcd(options, input)) {
-            comparison::readVcd(input.stream(), input.name(), map, dump);
-        } else {
-            comparison::readCsv(input.stream(), input.name(), map, dump);
+    const std::uint32_t number = options.number.value_or(0);
+    const veltra_ip_morvik_v1_0_generics& generics = options.decoder.generics;
+    const BlockCase block = {
+        "", "", {options.block, number, readBlock(options.block, number), generics}, options.decoder.iterations};
+    comparison::Dump dump = emptyDump(block);
+    readDump(options.dump, options.form, map, dump);
+    return {options.block,
+            coreText(generics, block.iterations),
+            {block},
+            {compareCase(block, shownName(options.dump), dump, options)}};
+}
+
+/// The report of a single block, or the first report of many and a summary.
+std::string textOf(const std::vector<ComparedSet>& sets)
+{
+    if (sets.size() == 1 && sets.front().results.size() == 1) {
+        return "core: " + sets.front().core + '\n' + sets.front().results.front().report;
+    }
+    std::string text = summaryText(sets);
+    for (const ComparedSet& set : sets) {
+        for (std::size_t i = 0; i < set.results.size(); ++i) {
+            if (set.results[i].verdict == Verdict::different) {
+                return text + "\nThe first that differs, " + set.folder + ", " + set.cases[i].title() + ":\n" +
+                       set.results[i].report;
+            }
         }
-    } catch (const base::Error&) {
-        input.expectWhole();
-        throw;
     }
-    input.expectWhole();
+    return text;
 }
 
-int compare(const Options& options)
+/// That of the worst result.
+int statusOf(const std::vector<ComparedSet>& sets)
 {
-    base::expectOwnFile(base::standardStream, {options.block, options.dump, options.map}, "reports");
-    const ComparedRun run = {
-        options.block, options.number, readBlock(options.block, options.number), options.decoder.generics};
-    const comparison::NameMap map = readMap(options.map);
-    const comparison::Model model =
-        comparison::computeModel(run.block, run.generics, options.decoder.iterations, std::cerr);
-    comparison::Dump dump(model.values.passes(), model.values.steps());
-    readDump(options, map, dump);
-    const std::string dumpName = options.dump == base::standardStream ? "<stdin>" : options.dump;
-    using comparison::Unknown;
-    const comparison::Comparison found =
-        comparison::compare(model, dump.values, options.ignoreUnknown ? Unknown::isIgnored : Unknown::differs);
-    if (found.compared() == 0) {
-        throw base::Error(dumpName +
-                          (found.unknown() > 0 ? ": has no known value" : ": has no value that the core computes"));
+    int worst = success;
+    for (const ComparedSet& set : sets) {
+        for (const CaseResult& result : set.results) {
+            const bool agrees = result.verdict == Verdict::equal;
+            worst = result.verdict == Verdict::unreadable ? badInputOrUsage
+                                                          : std::max<int>(worst, agrees ? success : differencesFound);
+            if (worst == badInputOrUsage) {
+                return worst;
+            }
+        }
     }
-    const comparison::Coverage coverage = comparison::coverageOf(model, dump);
-    // A few values may match another run by chance.
-    constexpr std::uint64_t telling = 64;
-    const auto otherRuns = found.knownDifferent() > 0 && found.knownCompared() >= telling
-                               ? findOtherRuns(run, dump.values)
-                               : std::vector<std::string>();
-    print(coreLine(run.generics, options.decoder.iterations) +
-          comparison::textOf({found, coverage, model, dump, dumpName, options.partial, otherRuns}));
-    return found.first || !(coverage.isComplete() || options.partial) ? differencesFound : success;
+    return worst;
+}
+
+/// Refuses options of the core beside --set: the set records them.
+void expectNoCoreBesideSet(const CLI::App& command)
+{
+    for (const char* const name : {"--num-pu", "--algorithm", "--iterations", "--tag-width"}) {
+        if (command.get_option(name)->count() > 0) {
+            throw base::Error(std::string(name) + " cannot be combined with --set, whose manifest has it");
+        }
+    }
+}
+
+int compare(const CLI::App& command, const CompareOptions& options)
+{
+    if (options.block.empty() == options.sets.empty()) {
+        throw base::Error("either --block or --set is required; see 'morvik compare --help'");
+    }
+    if (!options.sets.empty()) {
+        expectNoCoreBesideSet(command);
+    }
+    base::expectOwnFile(base::standardStream, inputsOf(options), "reports");
+    for (const std::string& output : {options.json, options.junit}) {
+        base::expectOwnFile(output, inputsOf(options), "results");
+    }
+    const comparison::NameMap map = readMap(options.map);
+    const std::vector<ComparedSet> sets =
+        options.sets.empty() ? std::vector<ComparedSet>{compareBlock(options, map)} : compareSets(options, map);
+    for (const ComparedSet& set : sets) {
+        for (const CaseResult& result : set.results) {
+            std::cerr << result.warnings;
+        }
+    }
+    if (!options.json.empty()) {
+        base::writeFile(options.json, jsonText(sets));
+    }
+    if (!options.junit.empty()) {
+        base::writeFile(options.junit, junitText(sets));
+    }
+    print(textOf(sets));
+    return statusOf(sets);
 }
 
 constexpr char explanationBeforeSignals[] =
@@ -118,39 +145,63 @@ x is a difference without --ignore-x. The map is a JSON object with other names 
 formats; docs/compare.md has examples.
 
 Exit status: 0 all values agree, 1 a difference was found or values are missing, 2 bad input
-or usage.
+or usage; of several blocks, the worst.
 
-Example:
-  morvik compare --block k40.csv --num-pu 8 --dump rtl.csv --map names.json)";
+Examples:
+  morvik compare --block k40.csv --num-pu 8 --dump rtl.csv --map names.json
+  morvik compare --set sets/* --dump '{set}/rtl/{block}.fst' --junit results.xml)";
+
+void addBlockOptions(CLI::App& command, CompareOptions& options)
+{
+    auto* block =
+        command.add_option("--block", options.block, "Soft values, as 'morvik decode' takes them")->type_name("FILE");
+    command.add_option("--set", options.sets, "Folders of 'morvik vectors', all of whose blocks to compare")
+        ->type_name("DIR...")
+        ->excludes(block);
+    command.add_option("--block-number", options.number, "Number of the block, from 0; default: 0, or all of a set")
+        ->transform(integerFrom(0, UINT32_MAX - 1))
+        ->type_name("N");
+}
+
+void addDumpOptions(CLI::App& command, CompareOptions& options)
+{
+    command
+        .add_option("--dump",
+                    options.dump,
+                    "Values of the simulation, as CSV, VCD or FST; for a set, {block} in the name stands for the "
+                    "number, {set} for the folder")
+        ->type_name("FILE")
+        ->required();
+    command.add_option("--map", options.map, "Names and number formats of the dump, as JSON")->type_name("FILE");
+    command.add_option("--format", options.form, "csv or vcd; by default from the file name extension")
+        ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
+        ->type_name("FORMAT");
+    command.add_flag("--ignore-x", options.ignoreUnknown, "Ignore unknown values (x), but count them");
+    command.add_flag("--partial", options.partial, "Accept missing values, but count them");
+}
+
+void addResultOptions(CLI::App& command, CompareOptions& options)
+{
+    command.add_option("--json", options.json, "Write all results to this file, as JSON")->type_name("FILE");
+    command.add_option("--junit", options.junit, "Write all results to this file, for CI servers")->type_name("FILE");
+    command.add_option("--threads", options.threads, "Threads that compare blocks of a set; default: as many as cores")
+        ->transform(integerFrom(1, 1024))
+        ->type_name("N");
+}
 
 }  // namespace
 
 Command addCompare(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("compare", "Find where a hardware simulation departs from the model");
-    const auto options = std::make_shared<Options>();
-
-    command->add_option("--block", options->block, "Soft values, as 'morvik decode' takes them")
-        ->type_name("FILE")
-        ->required();
-    command->add_option("--block-number", options->number, "Number of the block in the file, from 0")
-        ->transform(integerFrom(0, UINT32_MAX - 1))
-        ->type_name("N")
-        ->capture_default_str();
-    command->add_option("--dump", options->dump, "Values of the simulation, as CSV or VCD")
-        ->type_name("FILE")
-        ->required();
-    command->add_option("--map", options->map, "Names and number formats of the dump, as JSON")->type_name("FILE");
-    command->add_option("--format", options->form, "csv or vcd; by default from the file name extension")
-        ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
-        ->type_name("FORMAT");
-    command->add_flag("--ignore-x", options->ignoreUnknown, "Ignore unknown values (x), but count them");
-    command->add_flag("--partial", options->partial, "Accept missing values, but count them");
+    const auto options = std::make_shared<CompareOptions>();
+    addBlockOptions(*command, *options);
+    addDumpOptions(*command, *options);
+    addResultOptions(*command, *options);
     addDecoderOptions(*command, options->decoder);
     command->footer(explanationBeforeSignals + signalNames() + explanationAfterSignals);
-
-    const auto run = [options] {
-        return compare(*options);
+    const auto run = [options, command] {
+        return compare(*command, *options);
     };
     return {command, run};
 }

@@ -190,7 +190,7 @@ private:
                          std::to_string(itsNames.size()) + " of the header");
         }
         if (itsHasBlocks) {
-            itsDump = &itsSink.dumpOf(itsFile.blockNumber(field(itsBlock), itsMap));
+            itsDump = &itsFile.dumpOf(field(itsBlock), itsMap, itsSink);
         }
         followPlaces();
         if (!itsSignal) {

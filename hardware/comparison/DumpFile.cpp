@@ -50,14 +50,18 @@ unsigned DumpFile::count(const std::string& what, std::string_view text, unsigne
     return *value - first;
 }
 
-std::uint64_t DumpFile::blockNumber(std::string_view text, const NameMap& map) const
+Dump& DumpFile::dumpOf(std::string_view number, const NameMap& map, DumpSink& sink) const
 {
-    const auto number = base::parseNumber<std::uint64_t>(text);
-    if (!number || *number < map.firstBlock) {
-        fail("block " + base::shown(text) + " is not allowed, expected an integer from " +
+    const auto block = base::parseNumber<std::uint64_t>(number);
+    if (!block || *block < map.firstBlock) {
+        fail("block " + base::shown(number) + " is not allowed, expected an integer from " +
              std::to_string(map.firstBlock));
     }
-    return *number - map.firstBlock;
+    try {
+        return sink.dumpOf(*block - map.firstBlock);
+    } catch (const base::Error& error) {
+        fail("block " + std::to_string(*block) + ' ' + error.what());
+    }
 }
 
 std::int16_t DumpFile::packedValue(std::string_view name, std::string_view digits) const

@@ -31,8 +31,8 @@ public:
     /// Parses a number that counts from `first`, and returns it as 0 to `count` - 1.
     unsigned count(const std::string& what, std::string_view text, unsigned first, unsigned count) const;
 
-    /// Parses the number of a block, and returns it counted from 0.
-    std::uint64_t blockNumber(std::string_view text, const NameMap& map) const;
+    /// The dump of the block with this number as text.
+    Dump& dumpOf(std::string_view number, const NameMap& map, DumpSink& sink) const;
 
     /// Parses binary digits in two's complement; the dump calls the vector around them `name`.
     std::int16_t packedValue(std::string_view name, std::string_view digits) const;

@@ -79,7 +79,7 @@ public:
     {
     }
 
-    std::string text()
+    Report report()
     {
         addVerdictOnAll();
         addCoverage();
@@ -93,7 +93,7 @@ public:
             itsText += '\n';
             addCounts();
         }
-        return itsText;
+        return {itsText, itsFindings};
     }
 
     std::string firstDifference()
@@ -372,16 +372,17 @@ private:
     void addUnknown()
     {
         const auto add = [this](Stage stage, const std::string& count, const char* what) {
-            itsText += "Found in " + std::string(wordsOf(stage).values) + ", " + count + ":\n  " + what;
+            itsText += "Found in " + std::string(wordsOf(stage).values) + ", " + count + ":\n  " + what + ".\n";
+            itsFindings.push_back(std::string(wordsOf(stage).values) + ": " + what);
         };
         const Stage first = stageOf(itsComparison.first->signal);
         for (const Stage stage : stages) {
             const std::uint64_t faults = sum<&SignalCount::unknownFaults>(stage);
             const std::uint64_t unknown = itsComparison.ignoresUnknown ? 0 : sum<&SignalCount::unknown>(stage);
             if (faults > 0) {
-                add(stage, base::counted(faults, "fault"), "unknown (x), though all inputs are known.\n");
+                add(stage, base::counted(faults, "fault"), "unknown (x), though all inputs are known");
             } else if (!itsComparison.inputsAreKnown && stage == first && unknown > 0) {
-                add(stage, base::counted(unknown, "difference"), "unknown (x).\n");
+                add(stage, base::counted(unknown, "difference"), "unknown (x)");
             }
         }
     }
@@ -390,10 +391,12 @@ private:
     {
         addUnknown();
         if (!itsCompared.otherRuns.empty()) {
-            itsText += std::string("Found: ") + itsCompared.values + " is what the model computes " +
-                       eitherOf(itsCompared.otherRuns) + ".\n";
+            itsFindings.push_back(std::string(itsCompared.values) + " is what the model computes " +
+                                  eitherOf(itsCompared.otherRuns));
+            itsText += "Found: " + itsFindings.back() + ".\n";
         } else if (const auto shifts = findShifts(itsModel, itsDump.values); !shifts.empty()) {
-            itsText += "Found: " + eitherOf(shifts) + ".\n";
+            itsFindings.push_back(eitherOf(shifts));
+            itsText += "Found: " + itsFindings.back() + ".\n";
             return;
         }
         for (const Finding& finding : findPatterns(itsModel, itsDump.values, itsComparison)) {
@@ -409,12 +412,15 @@ private:
                    base::counted(finding.faults, itsComparison.inputsAreKnown ? "fault" : "difference");
         itsText += (finding.where.empty() ? "" : ", " + finding.where) + ":\n  ";
         const std::string part = format("%.0f %% of them", std::floor(100 * finding.explained));
+        const std::string how = finding.how.empty() ? "no known pattern" : eitherOf(finding.how);
+        const char* const chance =
+            finding.isByChance && !finding.how.empty() ? "; with so few, this may be chance" : "";
+        itsFindings.push_back(std::string(wordsOf(finding.stage).values) + ": " + how + chance);
         if (!finding.how.empty()) {
-            itsText += eitherOf(finding.how) + (finding.explained < 1 ? ", in " + part : "");
-            itsText += finding.isByChance ? "; with so few, this may be chance.\n" : ".\n";
+            itsText += how + (finding.explained < 1 ? ", in " + part : "") + chance + ".\n";
             return;
         }
-        itsText += "no known pattern";
+        itsText += how;
         if (!finding.shared.empty()) {
             itsText += finding.faults == 1 ? "; it is " : finding.explained < 1 ? "; " + part + " are " : "; all are ";
             itsText += finding.shared;
@@ -427,13 +433,19 @@ private:
     const Model& itsModel;
     const Dump& itsDump;
     std::string itsText;
+    std::vector<std::string> itsFindings;
 };
 
 }  // namespace
 
+Report reportOf(const Compared& compared)
+{
+    return Reporter(compared).report();
+}
+
 std::string textOf(const Compared& compared)
 {
-    return Reporter(compared).text();
+    return reportOf(compared).text;
 }
 
 std::string firstDifferenceOf(const Compared& compared)

@@ -25,7 +25,15 @@ struct Compared {
     bool countsAlways = false;           ///< whether signals are counted even if nothing differs
 };
 
-/// Formats the report.
+/// A comparison in words.
+struct Report {
+    std::string text;
+    std::vector<std::string> findings;  ///< the mistakes in it, each in a line: "branch metrics: the sign is flipped"
+};
+
+Report reportOf(const Compared& compared);
+
+/// Its text alone.
 std::string textOf(const Compared& compared);
 
 /// Formats the first difference alone: its place, what its inputs say, and what explains it.

@@ -275,7 +275,7 @@ private:
             itsFile.fail("no variable of the dump is a known signal; use a map to name them");
         }
         if (!itsHasBlocks) {
-            beginBlock(0);
+            beginBlock(itsMap.firstBlock);
         }
         itsOfNet.resize(itsNets.size());
         for (unsigned variable = 0; variable < itsDependents.size(); ++variable) {
@@ -450,19 +450,23 @@ private:
         const VcdVariable& variable = itsScopes.variables()[group.block];
         if (!itsMap.start.empty()) {
             if (variable.rises > 0) {
-                beginBlock(variable.rises - 1);
+                beginBlock(itsMap.firstBlock + variable.rises - 1);
             }
             return variable.rises > 0;
         }
         if (variable.value) {
-            beginBlock(itsFile.blockNumber(std::to_string(*variable.value), itsMap));
+            beginBlock(static_cast<std::uint64_t>(*variable.value));
         }
         return variable.value.has_value();
     }
 
-    void beginBlock(std::uint64_t block)
+    void beginBlock(std::uint64_t number)
     {
-        itsDump = &itsSink.dumpOf(block);
+        if (itsDump != nullptr && itsBlock == number) {
+            return;
+        }
+        itsBlock = number;
+        itsDump = &itsFile.dumpOf(std::to_string(number), itsMap, itsSink);
         if (!itsDump->waveform) {
             itsDump->waveform.emplace(itsDump->lines.size());
             itsDump->waveform->notes = itsScopes.notes();
@@ -515,6 +519,7 @@ private:
     NameMap itsReals;  // to read real values by
     DumpSink& itsSink;
     Dump* itsDump = nullptr;  // of the block at hand
+    std::uint64_t itsBlock = 0;
     bool itsHasBlocks;
     DumpLimits itsLimits;
     VcdScopes itsScopes;

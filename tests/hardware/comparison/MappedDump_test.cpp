@@ -198,6 +198,67 @@ TEST(MappedDump, UnpacksARowOfUnits)
     EXPECT_EQ(dump.values.at({0, llr, 41}), 3);
 }
 
+/// Takes the dumps of blocks 0 and 1.
+class TwoBlocks : public DumpSink {
+public:
+    Dump& dumpOf(std::uint64_t block) override
+    {
+        if (block > 1) {
+            throw morvik::base::Error("is one too many");
+        }
+        return block == 0 ? first : second;
+    }
+
+    Dump first{2, 43};
+    Dump second{2, 67};
+};
+
+void expectTwoBlocks(void (*readBlocks)(std::istream&, const std::string&, const NameMap&, DumpSink&),
+                     const std::string& text,
+                     const NameMap& map = {})
+{
+    TwoBlocks blocks;
+    std::istringstream input(text);
+    readBlocks(input, "dump", map, blocks);
+    EXPECT_EQ(blocks.first.values.at({0, llr, 0}), 1);
+    EXPECT_EQ(blocks.first.values.at({0, llr, 1}), 2);
+    EXPECT_EQ(blocks.second.values.at({0, llr, 0}), 3);
+    EXPECT_EQ(blocks.second.values.at({0, llr, 50}), 4);
+    EXPECT_TRUE(blocks.first.given[llr]);
+    EXPECT_TRUE(blocks.second.given[llr]);
+}
+
+TEST(MappedDump, TellsBlocksApart)
+{
+    expectTwoBlocks(readCsvBlocks, "block,half_iteration,step,llr\n0,0,0,1\n1,0,0,3\n0,0,1,2\n1,0,50,4\n");
+    expectTwoBlocks(readCsvBlocks,
+                    "n,half_iteration,step,llr\n1,0,0,1\n1,0,1,2\n2,0,0,3\n2,0,50,4\n",
+                    mapOf(R"({"columns": {"block": "n"}, "first_block": 1})"));
+    const std::string variables = "$var wire 13 s step $end\n$var wire 12 l llr $end\n";
+    expectTwoBlocks(readVcdBlocks,
+                    vcdOf(variables + "$var wire 8 b block $end\n",
+                          "#0\nb0 h\nb0 s\nb0 b\nb1 l\n#1\nb1 s\nb10 l\n#2\nb0 s\nb1 b\nb11 l\n#3\nb110010 s\n"
+                          "b100 l\n"));
+    // What the registers hold before the first start belongs to no block.
+    expectTwoBlocks(readVcdBlocks,
+                    vcdOf(variables + "$var wire 1 b go $end\n",
+                          "#0\nb0 h\nb0 s\n0b\nb1111 l\n#1\n1b\nb1 l\n#2\n0b\nb1 s\nb10 l\n#3\nb0 s\n1b\nb11 l\n"
+                          "#4\n0b\nb110010 s\nb100 l\n"),
+                    mapOf(R"({"start": "go"})"));
+}
+
+TEST(MappedDump, NamesABlockThatThereIsNot)
+{
+    TwoBlocks blocks;
+    std::istringstream input("block,half_iteration,step,llr\n0,0,0,1\n2,0,0,3\n");
+    try {
+        readCsvBlocks(input, "dump", {}, blocks);
+        FAIL() << "accepted";
+    } catch (const morvik::base::Error& error) {
+        EXPECT_STREQ(error.what(), "dump:3: block 2 is one too many");
+    }
+}
+
 TEST(MappedDump, NamesWhatIsWrongInAMap)
 {
     const auto expectMapRefused = [](const std::string& meaning, const std::string& message) {

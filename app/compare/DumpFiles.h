@@ -1,0 +1,25 @@
+// DumpFiles: reads dumps of any form from files.
+#ifndef MORVIK_APP_COMPARE_DUMPFILES_H
+#define MORVIK_APP_COMPARE_DUMPFILES_H
+
+#include <string>
+
+#include "hardware/comparison/Dump.h"
+
+namespace morvik {
+
+/// Reads the dump of a block. `form` is csv or vcd; if empty, content and name tell. Throws base::Error.
+void readDump(const std::string& file, const std::string& form, const comparison::NameMap& map, comparison::Dump& dump);
+
+/// Reads dumps of many blocks.
+void readDumps(const std::string& file,
+               const std::string& form,
+               const comparison::NameMap& map,
+               comparison::DumpSink& sink);
+
+/// The name of a dump in messages.
+std::string shownName(const std::string& file);
+
+}  // namespace morvik
+
+#endif

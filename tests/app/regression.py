@@ -1,0 +1,139 @@
+"""morvik compare on sets of vectors: 200 blocks over all configurations, one of them broken on purpose.
+
+    regression.py MORVIK
+"""
+
+import csv
+import gzip
+import json
+import pathlib
+import subprocess
+import sys
+import tempfile
+import unittest
+
+import junitparser
+
+MORVIK = pathlib.Path(sys.argv[1]).resolve()
+CORES = [(units, algorithm) for units in (2, 4, 8) for algorithm in ("max-log", "scaled", "table")]
+MISTAKE = "extrinsic values: bit 0 is flipped; with so few, this may be chance"
+BLOCKS = [23] * 2 + [22] * 7  # of each core, 200 in all
+
+
+def rows_of(file):
+    return list(csv.reader(file.read_text().splitlines()))
+
+
+class Regression(unittest.TestCase):
+    @classmethod
+    def setUpClass(cls):
+        cls.scratch = tempfile.TemporaryDirectory(prefix="morvik-regression-")
+        cls.folder = pathlib.Path(cls.scratch.name)
+        cls.sets = []
+        for (units, algorithm), blocks in zip(CORES, BLOCKS):
+            cls.sets.append(f"{units}_{algorithm}")
+            cls.run_morvik("vectors", "--out", cls.sets[-1], "--num-pu", units, "--algorithm", algorithm,
+                           "--block-size", 40, "--blocks", blocks, "--no-directed", "--iterations", 1,
+                           "--format", "csv", "--internal")
+        cls.break_one("4_scaled", block=7, step=5)
+
+    @classmethod
+    def tearDownClass(cls):
+        cls.scratch.cleanup()
+
+    @classmethod
+    def run_morvik(cls, *arguments, status=0):
+        result = subprocess.run([MORVIK, *map(str, arguments)], cwd=cls.folder, capture_output=True, text=True)
+        assert result.returncode == status, (result.returncode, result.stdout, result.stderr)
+        return result
+
+    @classmethod
+    def break_one(cls, name, block, step):
+        """Copies the internal values of each set to rtl.csv, and of one set one extrinsic value wrong."""
+        for each in cls.sets:
+            rows = rows_of(cls.folder / each / "internal.csv")
+            for row in rows[1:] if each == name else []:
+                if row[:3] == [str(block), "1", str(step)]:
+                    row[-1] = str(int(row[-1]) ^ 1)
+            with (cls.folder / each / "rtl.csv").open("w") as file:
+                csv.writer(file, lineterminator="\n").writerows(rows)
+
+    def expect_one_broken(self, report, dump):
+        cases = {(suite.name, case.name): case for suite in report for case in suite}
+        self.assertEqual(len(cases), 200)
+        self.assertEqual((report.tests, report.failures, report.errors), (200, 1, 0))
+        broken = [(place, case) for place, case in cases.items() if case.result]
+        self.assertEqual([place for place, _ in broken], [("4_scaled", "block 7 (random, K = 40)")])
+        failure = broken[0][1].result[0]
+        self.assertIsInstance(failure, junitparser.Failure)
+        self.assertEqual(failure.type, "different")
+        self.assertEqual(failure.message, "1 difference, 1 fault; the first is extrinsic of half-iteration 1, step 5")
+        self.assertTrue(failure.text.startswith(f"{dump}: compared 2 of 2 half-iterations"), failure.text)
+
+    def test_one_command_names_the_broken_block(self):
+        result = self.run_morvik("compare", "--set", *self.sets, "--dump", "{set}/rtl.csv", "--junit", "results.xml",
+                                 "--json", "results.json", status=1)
+        self.expect_one_broken(junitparser.JUnitXml.fromfile(str(self.folder / "results.xml")), "4_scaled/rtl.csv")
+        self.assertIn("4_scaled (4 units, scaled, 1 iteration), 22 blocks: 21 equal, 1 different\n"
+                      "  block 7 (random, K = 40), 4_scaled/rtl.csv: different: 1 difference, 1 fault; "
+                      "the first is extrinsic of half-iteration 1, step 5\n", result.stdout)
+        self.assertIn(f"\nin 1 block: {MISTAKE}\n", result.stdout)
+        self.assertIn("\n200 blocks: 199 equal, 1 different\n", result.stdout)
+        self.assertIn("\nThe first that differs, 4_scaled, block 7 (random, K = 40):\n4_scaled/rtl.csv: compared",
+                      result.stdout)
+        results = json.loads((self.folder / "results.json").read_text())
+        summary = results["summary"]
+        self.assertEqual([summary[key] for key in ("blocks", "equal", "different", "incomplete", "unreadable")],
+                         [200, 199, 1, 0, 0])
+        self.assertEqual(summary["mistakes"], [{"mistake": MISTAKE, "blocks": 1}])
+        self.assertEqual([(each["signal"], each["differences"], each["blocks"]) for each in summary["signals"]
+                          if each["differences"]], [("extrinsic", 1, 1)])
+        block = results["sets"][4]["blocks"][7]
+        self.assertEqual(block["first"], {"half_iteration": 1, "step": 5, "signal": "extrinsic"})
+        self.assertEqual(block["result"], "different")
+
+    def test_results_do_not_depend_on_threads(self):
+        results = [self.run_morvik("compare", "--set", *self.sets, "--dump", "{set}/rtl.csv", "--threads", threads,
+                                   status=1).stdout for threads in (1, 3)]
+        self.assertEqual(*results)
+
+    def test_each_block_has_a_dump(self):
+        folder = self.folder / "2_table"
+        rows = rows_of(folder / "rtl.csv")
+        for block in range(22):
+            with gzip.open(folder / f"rtl_{block}.csv.gz", "wt") as file:
+                csv.writer(file).writerows(row for row in rows if row[0] in ("block", str(block)))
+        (folder / "rtl_3.csv.gz").unlink()
+        arguments = ("compare", "--set", "2_table", "--dump", "{set}/rtl_{block}.csv.gz", "--junit", "each.xml")
+        result = self.run_morvik(*arguments, status=2)
+        reason = "2_table/rtl_3.csv.gz: cannot be opened: No such file or directory"
+        self.assertIn(f"22 blocks: 21 equal, 1 unreadable\n  block 3 (random, K = 40), 2_table/rtl_3.csv.gz: "
+                      f"unreadable: {reason}\n", result.stdout)
+        report = junitparser.JUnitXml.fromfile(str(self.folder / "each.xml"))
+        self.assertEqual((report.tests, report.failures, report.errors), (22, 0, 1))
+        one = self.run_morvik(*arguments, "--block-number", 4)
+        self.assertTrue(one.stdout.startswith("core: 2 units, table, 1 iteration\n2_table/rtl_4.csv.gz: compared 2 of"))
+
+    def test_a_file_that_ends_early_fails_the_rest(self):
+        lines = (self.folder / "2_scaled" / "rtl.csv").read_text().splitlines(keepends=True)
+        (self.folder / "early.csv").write_text("".join(lines[:1 + 2 * 86 + 5]))
+        result = self.run_morvik("compare", "--set", "2_scaled", "--dump", "early.csv", status=2)
+        self.assertIn("23 blocks: 2 equal, 1 incomplete, 20 unreadable\n", result.stdout)
+        (self.folder / "early.csv").write_text("".join(lines[:1 + 2 * 86 + 5]) + "0,1,1,1\n")
+        result = self.run_morvik("compare", "--set", "2_scaled", "--dump", "early.csv", status=2)
+        self.assertIn("23 blocks: 1 equal, 22 unreadable\n", result.stdout)
+        self.assertIn(", early.csv: unreadable: early.csv:179: 4 fields, expected the 26 of the header\n", result.stdout)
+
+    def test_wrong_use_is_refused(self):
+        for message, *arguments in (
+                ("either --block or --set is required; see 'morvik compare --help'",),
+                ("--num-pu cannot be combined with --set, whose manifest has it", "--set", "2_table", "--num-pu", 2),
+                ("--dump needs {set} in its name, as there are several sets", "--set", "2_table", "2_scaled"),
+                ("2_table: has 22 blocks, there is no block 22", "--set", "2_table", "--block-number", 22),
+                ("nowhere/manifest.json: cannot be opened: No such file or directory", "--set", "nowhere")):
+            result = self.run_morvik("compare", "--dump", "2_table/rtl.csv", *arguments, status=2)
+            self.assertEqual(result.stderr, f"morvik compare: {message}\n")
+
+
+if __name__ == "__main__":
+    unittest.main(argv=sys.argv[:1])
