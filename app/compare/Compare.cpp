@@ -101,8 +101,22 @@ void expectNoCoreBesideSet(const CLI::App& command)
     }
 }
 
+/// Prints a map for the dump, and names what it leaves out.
+int suggest(const CompareOptions& options)
+{
+    const comparison::SuggestedMap map = comparison::suggestMap(readDumpNames(options.dump, options.form));
+    print(map.json);
+    for (const std::string& note : map.notes) {
+        notice(note);
+    }
+    return success;
+}
+
 int compare(const CLI::App& command, const CompareOptions& options)
 {
+    if (options.suggestMap) {
+        return suggest(options);
+    }
     if (options.block.empty() == options.sets.empty()) {
         throw base::Error("either --block or --set is required; see 'morvik compare --help'");
     }
@@ -173,6 +187,7 @@ void addDumpOptions(CLI::App& command, CompareOptions& options)
         ->type_name("FILE")
         ->required();
     command.add_option("--map", options.map, "Names and number formats of the dump, as JSON")->type_name("FILE");
+    command.add_flag("--suggest-map", options.suggestMap, "Print a map for the names in the dump, and compare nothing");
     command.add_option("--format", options.form, "csv or vcd; by default from the file name extension")
         ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
         ->type_name("FORMAT");

@@ -24,6 +24,7 @@ struct CompareOptions {
     std::uint32_t threads = 0;  ///< 0: as many as cores
     bool ignoreUnknown = false;
     bool partial = false;
+    bool suggestMap = false;
     DecoderOptions decoder;
 };
 

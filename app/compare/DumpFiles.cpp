@@ -56,6 +56,13 @@ void readDumps(const std::string& file,
     read(file, form, map, comparison::readVcdBlocks, comparison::readCsvBlocks, sink);
 }
 
+comparison::DumpNames readDumpNames(const std::string& file, const std::string& form)
+{
+    base::UnpackedFile input(file);
+    const bool isWaveform = isVcd(file, form, input);
+    return (isWaveform ? comparison::namesOfVcd : comparison::namesOfCsv)(input.stream(), input.name());
+}
+
 std::string shownName(const std::string& file)
 {
     return file == base::standardStream ? "<stdin>" : file;

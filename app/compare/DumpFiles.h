@@ -5,6 +5,7 @@
 #include <string>
 
 #include "hardware/comparison/Dump.h"
+#include "hardware/comparison/DumpNames.h"
 
 namespace morvik {
 
@@ -16,6 +17,9 @@ void readDumps(const std::string& file,
                const std::string& form,
                const comparison::NameMap& map,
                comparison::DumpSink& sink);
+
+/// Reads the names in a dump.
+comparison::DumpNames readDumpNames(const std::string& file, const std::string& form);
 
 /// The name of a dump in messages.
 std::string shownName(const std::string& file);

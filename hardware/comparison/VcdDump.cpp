@@ -12,8 +12,8 @@
 #include <vector>
 
 #include "Dump.h"
-#include "DumpFile.h"
 #include "VcdScopes.h"
+#include "VcdWords.h"
 #include "base/Error.h"
 #include "base/Numbers.h"
 #include "base/Shown.h"
@@ -67,10 +67,10 @@ public:
         if (itsMap.namesRows) {
             itsFile.failAsAWhole("is VCD; the columns \"signal\" and \"value\" in a map are for CSV");
         }
-        while (nextWord()) {
-            if (itsWord[0] == '$') {
+        while (itsFile.nextWord()) {
+            if (itsFile.word()[0] == '$') {
                 readCommand();
-            } else if (itsWord[0] == '#') {
+            } else if (itsFile.word()[0] == '#') {
                 keepChanges();
                 readTime();
             } else {
@@ -85,54 +85,8 @@ private:
     /// More than any design has: guards against endless dumps.
     static constexpr unsigned mostNets = 1U << 23;
 
-    /// The most words in a row that bring neither a variable nor the first change at a new time: comments, times at
-    /// which nothing changes, and changes at one time, where each identifier may have two vectors.
-    static constexpr unsigned mostIdle = 4000000;
+    /// Each identifier may have two vectors at one time.
     static constexpr unsigned wordsOfChanges = 4;
-
-    bool nextWord()
-    {
-        const std::size_t most = mostIdle + wordsOfChanges * itsNets.size();
-        if (++itsIdle > most) {
-            itsFile.fail("more than " + std::to_string(most) + " words without a change at a new time");
-        }
-        while (true) {
-            itsRest.remove_prefix(std::min(itsRest.find_first_not_of(" \t"), itsRest.size()));
-            if (!itsRest.empty()) {
-                itsWord = itsRest.substr(0, itsRest.find_first_of(" \t"));
-                itsRest.remove_prefix(itsWord.size());
-                return true;
-            }
-            if (!itsFile.nextFilled()) {
-                return false;
-            }
-            itsRest = itsFile.text();
-        }
-    }
-
-    std::string expectWord(const char* what)
-    {
-        if (!nextWord() || itsWord == "$end") {
-            itsFile.fail(std::string("the dump ends where ") + what + " is expected");
-        }
-        return std::string(itsWord);
-    }
-
-    /// The words up to $end, without blanks between them; long texts such as comments are cut.
-    std::string restOfCommand()
-    {
-        constexpr std::size_t longest = 65536;
-        std::string rest;
-        for (;;) {
-            if (!nextWord()) {
-                itsFile.fail("a command without $end");
-            }
-            if (itsWord == "$end") {
-                return rest;
-            }
-            rest += rest.size() < longest ? itsWord : std::string_view();
-        }
-    }
 
     /// Prefixes errors with the location.
     template <class Action>
@@ -145,13 +99,13 @@ private:
 
     void readCommand()
     {
-        const std::string command(itsWord);
+        const std::string command(itsFile.word());
         if (command == "$dumpvars" || command == "$dumpall" || command == "$dumpon" || command == "$end") {
             return;  // changes inside are read like any others
         }
         if (command == "$scope") {
-            expectWord("the kind of a scope");
-            const std::string name = expectWord("the name of a scope");
+            itsFile.expectWord("the kind of a scope");
+            const std::string name = itsFile.expectWord("the name of a scope");
             placed([&] { itsScopes.enter(name); });
         } else if (command == "$upscope") {
             placed([this] { itsScopes.leave(); });
@@ -159,12 +113,12 @@ private:
             readVariable();
             return;
         } else if (command == "$timescale") {
-            readTimescale(restOfCommand());
+            readTimescale(itsFile.restOfCommand());
             return;
         } else if (command == "$dumpoff") {
             forgetAll();
         }
-        restOfCommand();
+        itsFile.restOfCommand();
     }
 
     void forgetAll()
@@ -189,9 +143,9 @@ private:
 
     void readTime()
     {
-        const auto time = base::parseNumber<std::uint64_t>(itsWord.substr(1));
+        const auto time = base::parseNumber<std::uint64_t>(itsFile.word().substr(1));
         if (!time || *time > std::numeric_limits<std::uint64_t>::max() / itsTimescale.factor) {
-            itsFile.fail(shown(itsWord) + " is not a time");
+            itsFile.fail(shown(itsFile.word()) + " is not a time");
         }
         itsTime = *time * itsTimescale.factor;
         if (++itsIdleTimes > itsLimits.idleTimes) {
@@ -201,18 +155,19 @@ private:
 
     void readVariable()
     {
-        itsIdle = 0;
+        itsFile.goOn();
         VcdVariable variable;
-        expectWord("the kind of a variable");
-        const std::string width = expectWord("the width of a variable");
-        const std::string identifier = expectWord("the identifier of a variable");
-        variable.name = expectWord("the name of a variable");
-        variable.name = plainName(variable.name + restOfCommand());
+        itsFile.expectWord("the kind of a variable");
+        const std::string width = itsFile.expectWord("the width of a variable");
+        const std::string identifier = itsFile.expectWord("the identifier of a variable");
+        variable.name = itsFile.nameOfVariable();
         if (itsIsDeclared) {
             itsFile.fail("variable " + shown(variable.name) + " after the first values");
         }
         variable.net = static_cast<unsigned>(itsNets.size());
-        variable.net = itsNets.try_emplace(identifier, variable.net).first->second;
+        const auto [net, isNew] = itsNets.try_emplace(identifier, variable.net);
+        variable.net = net->second;
+        itsFile.allow(isNew ? wordsOfChanges : 0);
         if (variable.net == mostNets) {
             itsFile.fail("more than " + std::to_string(mostNets) + " identifiers");
         }
@@ -232,17 +187,6 @@ private:
             itsFile.fail(variable.name + " has " + std::to_string(width) + " bits, the map packs " +
                          std::to_string(element.lowest + element.bits) + " or more in it");
         }
-    }
-
-    /// The name without the bit range and the escape mark. An element, NAME[N], keeps its number.
-    static std::string plainName(std::string name)
-    {
-        const std::size_t bracket = name.rfind('[');
-        if (bracket != std::string::npos && name.find(':', bracket) != std::string::npos) {
-            name.erase(bracket);
-        }
-        name.erase(0, name[0] == '\\' ? 1 : 0);
-        return name;
     }
 
     /// Chooses the variables to read, and finds the groups that depend on them.
@@ -289,26 +233,26 @@ private:
     {
         if (itsTime != itsTimeOfChange) {
             itsTimeOfChange = itsTime;
-            itsIdle = 0;
+            itsFile.goOn();
         }
         endDeclarations();
-        std::string_view digits = itsWord;
+        std::string_view digits = itsFile.word();
         std::string_view identifier;
         std::string kept;
         const char kind = digits[0];
         if (kind == 'b' || kind == 'B' || kind == 'r' || kind == 'R') {
             kept = digits.substr(1);
             digits = kept;
-            expectWord("the identifier of a variable");
-            identifier = itsWord;
+            itsFile.expectWord("the identifier of a variable");
+            identifier = itsFile.word();
         } else if (digitOf(kind) != Digit::none) {
             identifier = digits.substr(1);
             digits = digits.substr(0, 1);
         } else if (kind == 's' || kind == 'S') {
-            expectWord("the identifier of a variable");
+            itsFile.expectWord("the identifier of a variable");
             return;  // a string
         } else {
-            itsFile.fail(shown(itsWord) + " is not a value change");
+            itsFile.fail(shown(itsFile.word()) + " is not a value change");
         }
         const auto found = itsNets.find(identifier);
         if (found == itsNets.end()) {
@@ -514,7 +458,7 @@ private:
                      std::to_string(place.step) + "; use a map to choose one, or \"valid\" to tell when they count");
     }
 
-    DumpFile itsFile;
+    VcdWords itsFile;
     const NameMap& itsMap;
     NameMap itsReals;  // to read real values by
     DumpSink& itsSink;
@@ -523,9 +467,6 @@ private:
     bool itsHasBlocks;
     DumpLimits itsLimits;
     VcdScopes itsScopes;
-    std::string_view itsRest;
-    std::string_view itsWord;
-    std::size_t itsIdle = 0;         // words since the last variable or the first change at the last time
     std::uint64_t itsIdleTimes = 0;  // since a place has got a value
     Timescale itsTimescale;
     std::uint64_t itsTime = 0;                     // in the timescale's unit

@@ -2,8 +2,10 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <vector>
 
 #include "DumpText.h"
+#include "hardware/comparison/DumpNames.h"
 #include "hardware/comparison/NamePattern.h"
 
 namespace {
@@ -257,6 +259,45 @@ TEST(MappedDump, NamesABlockThatThereIsNot)
     } catch (const morvik::base::Error& error) {
         EXPECT_STREQ(error.what(), "dump:3: block 2 is one too many");
     }
+}
+
+TEST(SuggestedMap, PlacesTheUsualNamesOfAWaveform)
+{
+    const std::string text = vcdOf(
+        "$var wire 13 s trellis_step_q $end\n$var wire 96 a alpha_vec [95:0] $end\n"
+        "$var wire 12 b bwd_metric_3_q [11:0] $end\n$var wire 9 d bwd_metric_7_q $end\n"
+        "$var wire 12 g bm[1] $end\n$var wire 12 e leOut $end\n$var wire 1 c clk $end\n"
+        "$var wire 12 l llr $end\n$var wire 200 x extrinsic_mem $end\n",
+        "#0\nb0 h\nb1 s\nb11000000000010 a\nb101 b\nb111 g\nb1 e\nb10 l\nb1 d\n");
+    std::istringstream input(text);
+    const SuggestedMap map = suggestMap(namesOfVcd(input, "dump"));
+    EXPECT_EQ(map.notes, (std::vector<std::string>{"not placed: clk", "not placed: extrinsic_mem"}));
+    const Dump dump = read(readVcd, text, mapOf(map.json));
+    EXPECT_EQ(dump.values.at({0, alpha0, 1}), 2);
+    EXPECT_EQ(dump.values.at({0, alpha0 + 1, 1}), 3);
+    EXPECT_EQ(dump.values.at({0, beta0 + 3, 1}), 5);
+    EXPECT_EQ(dump.values.at({0, beta0 + 7, 1}), 1);
+    EXPECT_EQ(dump.values.at({0, morvik::signalsOf(morvik::Stage::branch).first + 1, 1}), 7);
+    EXPECT_EQ(dump.values.at({0, morvik::signalsOf(morvik::Stage::extrinsic).first, 1}), 1);
+    EXPECT_EQ(dump.values.at({0, llr, 1}), 2);
+}
+
+TEST(SuggestedMap, PlacesTheNamesOfRows)
+{
+    const std::string text = "half_iteration,step,signal,value\n0,0,fwd[0],00a\n0,0,fwd[3],fff\n0,0,busy,1\n";
+    std::istringstream input(text);
+    const SuggestedMap map = suggestMap(namesOfCsv(input, "dump"));
+    EXPECT_EQ(map.notes, std::vector<std::string>{"not placed: busy"});
+    const Dump dump = read(readCsv, text, mapOf(map.json));
+    EXPECT_EQ(dump.values.at({0, alpha0, 0}), 10);
+    EXPECT_EQ(dump.values.at({0, alpha3, 0}), -1);
+    std::istringstream wide("pass,k,gamma_0,gamma_4,foo\n");
+    const SuggestedMap columns = suggestMap(namesOfCsv(wide, "dump"));
+    EXPECT_EQ(columns.json, "{\n  \"columns\": {\n    \"half_iteration\": \"pass\",\n    \"step\": \"k\"\n  }\n}\n");
+    EXPECT_EQ(columns.notes,
+              (std::vector<std::string>{"not placed: foo", "not placed: gamma_0", "not placed: gamma_4"}));
+    std::istringstream none("a,llr\n");
+    EXPECT_EQ(suggestMap(namesOfCsv(none, "dump")).notes.front(), "no name looks like that of the half-iteration");
 }
 
 TEST(MappedDump, NamesWhatIsWrongInAMap)
