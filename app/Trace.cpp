@@ -137,8 +137,9 @@ base::OutputFile openOutput(const Options& options)
 
 std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const rules::Cut& cut)
 {
-    if (options.format == "vcd") {
-        return trace::vcdTrace(openOutput(options), cut, options.selection);
+    if (options.format == "vcd" || options.format == "fst") {
+        return (options.format == "vcd" ? trace::vcdTrace : trace::fstTrace)(
+            openOutput(options), cut, options.selection);
     }
     const tables::Table table = trace::traceTable(options.selection);
     auto rows = options.format == "csv" ? tables::csvWriter(openOutput(options), table)
@@ -152,7 +153,7 @@ void write(Options options)
     selectPasses(options, selection);
     if (options.format == "text" && (!selection.signals.empty() || !selection.units.empty())) {
         throw base::Error(
-            "--signals and --units need --format csv, vcd or npy: they do not apply to the library's own text");
+            "--signals and --units need --format csv, vcd, fst or npy: they do not apply to the library's own text");
     }
     const SoftBlock block = readBlock(options.input, options.block);
     if (options.format == "text") {
@@ -185,6 +186,7 @@ constexpr char explanationBeforeSignals[] =
     R"(FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
 interleaved constituent code. 'text' is the library's own trace, which lacks the branch
 metrics. 'vcd' has a scope for each unit and thread, and one unit of time for each trellis step.
+'fst' is the same, compact; it needs vcd2fst of GTKWave.
 docs/trace.md has the details.
 
 Signals: )";
@@ -224,8 +226,8 @@ Command addTrace(CLI::App& app)
     command->add_option("--output", options->output, "File for the trace; - for standard output")
         ->type_name("FILE")
         ->capture_default_str();
-    command->add_option("--format", options->format, "text, csv, vcd or npy")
-        ->transform(oneOf({{"text", "text"}, {"csv", "csv"}, {"vcd", "vcd"}, {"npy", "npy"}}))
+    command->add_option("--format", options->format, "text, csv, vcd, fst or npy")
+        ->transform(oneOf({{"text", "text"}, {"csv", "csv"}, {"vcd", "vcd"}, {"fst", "fst"}, {"npy", "npy"}}))
         ->type_name("FORMAT")
         ->capture_default_str();
     addSelectionOptions(*command, *options);

@@ -34,6 +34,9 @@ std::unique_ptr<TraceWriter> tableTrace(std::unique_ptr<tables::TableWriter> tab
 /// Waveforms as a value change dump (IEEE 1364-2001, clause 18).
 std::unique_ptr<TraceWriter> vcdTrace(base::OutputFile file, const rules::Cut& cut, const Selection& selection);
 
+/// The same as an FST waveform, by GTKWave's vcd2fst. Throws base::Error if that is not installed.
+std::unique_ptr<TraceWriter> fstTrace(base::OutputFile file, const rules::Cut& cut, const Selection& selection);
+
 /// Writes the library's own trace of the selected half-iterations, after the input streams.
 void writeText(const SoftBlock& block,
                const veltra_ip_morvik_v1_0_generics& generics,

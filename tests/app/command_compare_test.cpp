@@ -37,7 +37,7 @@ TEST_F(Compare, FindsNoDifferenceInCoresWithOwnRecursions)
 TEST_F(Compare, AgreesWithTheTraceOfTheModel)
 {
     writeBlock(1088);
-    for (const char* const format : {"csv", "vcd"}) {
+    for (const char* const format : {"csv", "vcd", "fst"}) {
         const std::string file = std::string("trace.") + format;
         const CommandResult traced =
             morvik.run({"trace", "block.csv", "--iterations", "4", "--format", format, "--output", file});
@@ -75,7 +75,11 @@ TEST_F(Compare, ReadsPackedDumps)
     const std::string path = std::getenv("PATH");
     ASSERT_EQ(setenv("PATH", "/nowhere", 1), 0);
     const CommandResult withoutTool = compareWith("trace.fst");
+    const CommandResult notWritten = morvik.run({"trace", "block.csv", "--format", "fst", "--output", "other.fst"});
     ASSERT_EQ(setenv("PATH", path.c_str(), 1), 0);
+    EXPECT_EQ(notWritten.err,
+              "morvik trace: vcd2fst, which writes FST waveforms (Debian package gtkwave), cannot be started: No such "
+              "file or directory\n");
     expectRefused(withoutTool,
                   "trace.fst: is an FST waveform, which fst2vcd reads (Debian package gtkwave), and fst2vcd cannot be "
                   "started: No such file or directory");

@@ -294,9 +294,10 @@ TEST_F(Trace, RefusesWhatIsNotAllowed)
                   "--units: unit 1 computes nothing of a block of 40 bits with --num-pu 2, unit 0 does");
     expectRefused({vectors("k1024.csv"), "--format", "vcd", "--num-pu", "8", "--units", "0,8"},
                   "--units: unit 8 computes nothing of a block of 1024 bits with --num-pu 8, units 0 to 7 do");
-    expectRefused({k40, "--format", "fst"}, "--format: \"fst\" is not allowed, expected text, csv, vcd or npy" + help);
+    expectRefused({k40, "--format", "fsdb"},
+                  "--format: \"fsdb\" is not allowed, expected text, csv, vcd, fst or npy" + help);
     const std::string own =
-        "--signals and --units need --format csv, vcd or npy: they do not apply to the library's own text";
+        "--signals and --units need --format csv, vcd, fst or npy: they do not apply to the library's own text";
     expectRefused({k40, "--units", "0"}, own);
     expectRefused({k40, "--signals", "llr"}, own);
     expectRefused({k40, "--format", "npy"}, "--format npy needs a regular file; use --output FILE");
@@ -317,7 +318,7 @@ TEST_F(Trace, TellsWhatIsWrongWithFiles)
     expectRefused({"in.csv", "--output", "in.csv"},
                   "in.csv: is read as in.csv, traced values need a file of their own");
     EXPECT_EQ(morvik.read("in.csv"), header + '\n' + zeroRows("0", 44));
-    for (const std::string format : {"text", "csv", "vcd", "npy"}) {
+    for (const std::string format : {"text", "csv", "vcd", "fst", "npy"}) {
         expectRefused({"in.csv", "--format", format, "--output", "nowhere/out"},
                       "nowhere/out: cannot be written: No such file or directory");
         expectRefused({"in.csv", "--format", format, "--output", "/dev/full"},
