@@ -5,7 +5,7 @@
 #include <cstdint>
 #include <string_view>
 
-#include "base/InputFile.h"
+#include "StimulusFile.h"
 #include "base/Numbers.h"
 #include "base/Shown.h"
 #include "base/Text.h"
@@ -112,7 +112,7 @@ std::int32_t SoftValueReader::value(std::size_t column) const
 
 SoftBlock readBlock(const std::string& file, std::uint32_t number)
 {
-    base::InputFile input(file);
+    StimulusFile input(file);
     SoftValueReader reader(input.stream(), input.name());
     SoftBlock block;
     for (std::uint32_t i = 0; i <= number; ++i) {

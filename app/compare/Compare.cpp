@@ -188,8 +188,11 @@ void addDumpOptions(CLI::App& command, CompareOptions& options)
         ->required();
     command.add_option("--map", options.map, "Names and number formats of the dump, as JSON")->type_name("FILE");
     command.add_flag("--suggest-map", options.suggestMap, "Print a map for the names in the dump, and compare nothing");
-    command.add_option("--format", options.form, "csv or vcd; by default from the file name extension")
-        ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}}))
+    command
+        .add_option("--format",
+                    options.form,
+                    "csv, vcd, or memh, npy or c of 'morvik vectors'; by default from the file name extension")
+        ->transform(oneOf({{"csv", "csv"}, {"vcd", "vcd"}, {"memh", "memh"}, {"npy", "npy"}, {"c", "c"}}))
         ->type_name("FORMAT");
     command.add_flag("--ignore-x", options.ignoreUnknown, "Ignore unknown values (x), but count them");
     command.add_flag("--partial", options.partial, "Accept missing values, but count them");

@@ -9,13 +9,15 @@
 
 namespace morvik {
 
-/// Reads the dump of a block. `form` is csv or vcd; if empty, content and name tell. Throws base::Error.
+/// Reads the dump of a block. `form` is csv, vcd, or the format of a table `internal` of morvik vectors; if empty,
+/// content and name tell. Throws base::Error.
 void readDump(const std::string& file, const std::string& form, const comparison::NameMap& map, comparison::Dump& dump);
 
-/// Reads dumps of many blocks.
+/// Reads dumps of blocks 0 to `blocks` - 1, or of some of them.
 void readDumps(const std::string& file,
                const std::string& form,
                const comparison::NameMap& map,
+               std::uint64_t blocks,
                comparison::DumpSink& sink);
 
 /// Reads the names in a dump.

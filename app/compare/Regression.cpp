@@ -56,9 +56,7 @@ ComparedSet readSet(const std::string& folder)
 {
     vectors::expectPlaced(folder);
     const vectors::Manifest manifest = vectors::readManifest(folder + '/' + vectors::manifestName);
-    vectors::Settings settings = manifest.settings;
-    settings.ratios = false;
-    settings.internal = false;
+    const vectors::Settings settings = vectors::blocksAlone(manifest);
     vectors::BlockReader reader(folder, *tables::findFormat(manifest.formats.front().name), settings);
     ComparedSet set;
     set.folder = folder;
@@ -185,7 +183,7 @@ void compareTogether(ComparedSet& set,
     DumpQueue queue(set, file, options, map, threads);
     std::string reason;
     try {
-        readDumps(file, options.form, map, queue);
+        readDumps(file, options.form, map, set.cases.size(), queue);
     } catch (const base::Error& error) {
         reason = error.what();
     }

@@ -16,6 +16,7 @@
 #include "DecoderOptions.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "StimulusFile.h"
 #include "TransportDecode.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
@@ -155,7 +156,7 @@ void decodeBlocks(const Options& options,
 
 int decode(const Options& options)
 {
-    base::InputFile input(options.input);
+    StimulusFile input(options.input);
     SoftValueReader reader(input.stream(), input.name());
     std::optional<base::InputFile> referenceFile;
     std::optional<ReferenceBits> reference;

@@ -217,7 +217,7 @@ private:
     /// Refuses what can be no signal, whatever numbers stand for the words of the pattern.
     std::string signalText(const std::string& theirs, const Json& value) const
     {
-        const std::string signal = value.is_string() ? value.get<std::string>() : "";
+        std::string signal = value.is_string() ? value.get<std::string>() : "";
         for (unsigned number = 0; number < signalsOf(Stage::forward).count; ++number) {
             if (signalCalled(withNumber(theirs, signal, number))) {
                 return signal;

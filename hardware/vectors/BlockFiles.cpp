@@ -26,15 +26,6 @@ tables::Table blocksTable()
              {"first_bit", 32, false}}};
 }
 
-tables::Table internalTable()
-{
-    tables::Table table = {"internal", {{"half_iteration", 5, false}, {"step", 13, false}}};
-    for (const Signal& signal : passSignals) {
-        table.columns.push_back({signal.name, passBits, true});
-    }
-    return table;
-}
-
 /// Refuses a row that cannot belong to a set of blocks.
 void checkBlock(const tables::Row& row, std::uint32_t iterations, const std::string& place)
 {
@@ -48,6 +39,15 @@ void checkBlock(const tables::Row& row, std::uint32_t iterations, const std::str
 }
 
 }  // namespace
+
+tables::Table internalTable()
+{
+    tables::Table table = {"internal", {{"half_iteration", 5, false}, {"step", 13, false}}};
+    for (const Signal& signal : passSignals) {
+        table.columns.push_back({signal.name, passBits, true});
+    }
+    return table;
+}
 
 Layout::Layout(const tables::Format& format, const Settings& settings)
     : tables({blocksTable()}), streamsAreSeparate(settings.separateStreams && format.name == "memh")

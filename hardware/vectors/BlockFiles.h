@@ -39,6 +39,9 @@ struct Layout {
     std::size_t internal = 0;  ///< 0 if there are none
 };
 
+/// The table of values of passes: half-iteration, step, and each signal.
+tables::Table internalTable();
+
 /// The files of all tables that a set can have.
 std::set<std::string> filesOfAllTables();
 

@@ -204,6 +204,14 @@ ManifestFormat formatFrom(const base::Json& value, const Settings& settings, con
 
 }  // namespace
 
+Settings blocksAlone(const Manifest& manifest)
+{
+    Settings settings = manifest.settings;
+    settings.ratios = false;
+    settings.internal = false;
+    return settings;
+}
+
 std::string manifestText(const Manifest& manifest)
 {
     Json json;

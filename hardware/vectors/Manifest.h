@@ -41,6 +41,9 @@ struct Manifest {
     std::vector<ManifestFormat> formats;
 };
 
+/// Settings by which a BlockReader reads the blocks alone, without ratios and internal values.
+Settings blocksAlone(const Manifest& manifest);
+
 constexpr char manifestName[] = "manifest.json";
 
 std::string manifestText(const Manifest& manifest);

@@ -124,6 +124,26 @@ class Regression(unittest.TestCase):
         self.assertIn("23 blocks: 1 equal, 22 unreadable\n", result.stdout)
         self.assertIn(", early.csv: unreadable: early.csv:179: 4 fields, expected the 26 of the header\n", result.stdout)
 
+    def test_every_format_of_vectors_is_read(self):
+        formats = ("memh", "csv", "npy", "c")
+        self.run_morvik("vectors", "--out", "all", "--block-size", 48, "--blocks", 2, "--iterations", 1,
+                        "--no-directed", "--internal", "--format", ",".join(formats))
+        decisions = {self.run_morvik("decode", name).stdout
+                     for name in ["all"] + [f"all/stimulus.{each}" for each in formats]}
+        self.assertEqual([len(each.split()) for each in decisions], [2])
+        for each in formats:
+            result = self.run_morvik("compare", "--set", "all", "--dump", f"all/internal.{each}")
+            self.assertIn("2 blocks: 2 equal\n", result.stdout)
+        for each in ("memh", "npy", "c"):
+            self.run_morvik("vectors", "--out", "one", "--block-size", 48, "--blocks", 1, "--iterations", 1,
+                            "--no-directed", "--internal", "--format", each)
+            arguments = ("compare", "--block", f"one/stimulus.{each}", "--dump", f"one/internal.{each}")
+            self.assertIn(" values: all equal to the model\n",
+                          self.run_morvik(*arguments, "--iterations", 1).stdout)
+            self.assertIn("Incomplete: ", self.run_morvik(*arguments, "--iterations", 2, status=1).stdout)
+        result = self.run_morvik("compare", "--block", "all", "--dump", "all/internal.npy", "--iterations", 1, status=2)
+        self.assertEqual(result.stderr, "morvik compare: all/internal.npy: row 102: has more rows than the block needs\n")
+
     def test_wrong_use_is_refused(self):
         for message, *arguments in (
                 ("either --block or --set is required; see 'morvik compare --help'",),
