@@ -24,6 +24,32 @@ def rows_of(file):
     return list(csv.reader(file.read_text().splitlines()))
 
 
+def player(words, blocks, rows):
+    """A module that shows internal values of blocks, of so many rows each, as a core has them in registers."""
+    names = ["intrinsic"] + [f"{kind}{i}" for kind, count in (("g", 4), ("alpha", 8), ("beta", 8)) for i in range(count)]
+    names += ["llr", "extrinsic"]
+    wires = "".join(f"  wire [11:0] {name} = row[{24 + 12 * i} +: 12];\n" for i, name in enumerate(names))
+    return f"""module player;
+  reg [{23 + 12 * len(names)}:0] all [0:{blocks * rows - 1}];
+  reg [{23 + 12 * len(names)}:0] row;
+  reg [7:0] block;
+  wire [4:0] half_iteration = row[4:0];
+  wire [12:0] step = row[20:8];
+{wires}  integer i;
+  initial begin
+    $readmemh("{words}", all);
+    $dumpfile("player.fst");
+    $dumpvars(0, player);
+    for (i = 0; i < {blocks * rows}; i = i + 1) begin
+      #1 row = all[i];
+      block = i / {rows};
+    end
+    #1 $finish;
+  end
+endmodule
+"""
+
+
 class Regression(unittest.TestCase):
     @classmethod
     def setUpClass(cls):
@@ -143,6 +169,15 @@ class Regression(unittest.TestCase):
             self.assertIn("Incomplete: ", self.run_morvik(*arguments, "--iterations", 2, status=1).stdout)
         result = self.run_morvik("compare", "--block", "all", "--dump", "all/internal.npy", "--iterations", 1, status=2)
         self.assertEqual(result.stderr, "morvik compare: all/internal.npy: row 102: has more rows than the block needs\n")
+
+    def test_a_simulators_waveform_has_all_blocks(self):
+        self.run_morvik("vectors", "--out", "played", "--block-size", 40, "--blocks", 2, "--iterations", 1,
+                        "--no-directed", "--internal", "--format", "memh")
+        (self.folder / "player.v").write_text(player("played/internal.memh", 2, 2 * 43))
+        for command in (["iverilog", "-o", "player.vvp", "player.v"], ["vvp", "-n", "player.vvp", "-fst"]):
+            subprocess.run(command, cwd=self.folder, check=True, capture_output=True)
+        result = self.run_morvik("compare", "--set", "played", "--dump", "player.fst")
+        self.assertIn("2 blocks: 2 equal\n", result.stdout)
 
     def test_wrong_use_is_refused(self):
         for message, *arguments in (
