@@ -31,6 +31,7 @@ VcdScopes::VcdScopes(const NameMap& map, bool hasBlocks) : itsMap(map), itsHasBl
         itsControls.push_back(controls);
     }
     itsControlVariables.resize(itsControlNames.size());
+    itsScopes.emplace_back();
     for (const auto& [name, elements] : map.signals) {
         itsLongestName = std::max(itsLongestName, name.size());
     }
@@ -68,7 +69,7 @@ void VcdScopes::enter(const std::string& name)
 
 void VcdScopes::leave()
 {
-    if (itsScope == nobody) {
+    if (itsScope == outside) {
         throw base::Error("$upscope outside of all scopes");
     }
     itsScope = itsScopes[itsScope].parent;
@@ -82,7 +83,7 @@ void VcdScopes::forEachName(const VcdVariable& variable, Use use) const
     std::string name = variable.name;
     use(name, false);
     std::size_t parts = 1;
-    for (unsigned scope = variable.scope; scope != nobody; scope = itsScopes[scope].parent) {
+    for (unsigned scope = variable.scope; scope != outside; scope = itsScopes[scope].parent) {
         const std::size_t length = name.size() + itsScopes[scope].name.size();
         const bool mayMatchAPattern = ++parts <= itsMostParts && length <= longestOfPattern;
         if (length >= itsLongestName && !mayMatchAPattern) {
@@ -128,9 +129,6 @@ bool VcdScopes::takeControls(const VcdVariable& variable, unsigned number)
 
 std::size_t VcdScopes::declare(VcdVariable variable)
 {
-    if (itsScope == nobody) {
-        throw base::Error("variable " + base::shown(variable.name) + " outside of all scopes");
-    }
     variable.scope = itsScope;
     const std::vector<Element> elements = findElements(variable);
     const auto number = static_cast<unsigned>(itsVariables.size());
@@ -320,7 +318,7 @@ std::string VcdScopes::pathOf(const VcdVariable& variable) const
 {
     constexpr std::size_t longest = 200;
     std::string path = variable.name;
-    for (unsigned scope = variable.scope; scope != nobody && path.size() <= longest; scope = itsScopes[scope].parent) {
+    for (unsigned scope = variable.scope; scope != outside && path.size() <= longest; scope = itsScopes[scope].parent) {
         path.insert(0, itsScopes[scope].name + '.');
     }
     return path.size() <= longest ? base::visible(path)

@@ -19,6 +19,9 @@ namespace morvik::comparison {
 
 constexpr unsigned nobody = ~0U;
 
+/// The scope around all others, without a name. GHDL writes the top level's variables there in FST.
+constexpr unsigned outside = 0;
+
 /// Whether a variable tells of the place and validity of values, or holds some.
 enum class Role : std::uint8_t { control, signal };
 
@@ -143,7 +146,7 @@ private:
     std::vector<std::vector<unsigned>> itsInherited;                // the same with those of enclosing scopes
     std::vector<VcdScope> itsScopes;
     std::map<std::pair<unsigned, std::string>, unsigned> itsScopeNumbers;  // by parent and name
-    unsigned itsScope = nobody;
+    unsigned itsScope = outside;
     std::vector<VcdVariable> itsVariables;
     std::vector<VcdGroup> itsGroups;
     std::map<std::pair<unsigned, unsigned>, std::size_t> itsGroupNumbers;  // by scope and timing

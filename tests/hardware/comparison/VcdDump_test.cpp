@@ -127,6 +127,19 @@ TEST(VcdDump, ComesBackToAScope)
     EXPECT_EQ(dump.values.at({1, llr, 2}), 5);
 }
 
+// GHDL's FST has the top level's variables outside of all scopes.
+TEST(VcdDump, ReadsVariablesOutsideOfScopes)
+{
+    const Dump dump = read(readVcd,
+                           "$var integer 1 h half_iteration $end\n$var integer 1 s step $end\n"
+                           "$scope module core $end\n$var wire 12 l llr[11:0] $end\n$upscope $end\n"
+                           "$var wire 12 a alpha3[11:0] $end\n$enddefinitions $end\n#0\n1h\nb10 s\nb101 l\nb11 a\n");
+    EXPECT_EQ(dump.values.at({1, llr, 2}), 5);
+    EXPECT_EQ(dump.values.at({1, alpha3, 2}), 3);
+    EXPECT_EQ(dump.waveform->names.begin()->second, "core.llr");
+    EXPECT_EQ(dump.waveform->names.rbegin()->second, "alpha3");
+}
+
 TEST(VcdDump, ReadsTheNineStatesOfVhdl)
 {
     const Dump dump = read(readVcd,
