@@ -185,7 +185,7 @@ private:
     bool placeInStage(const DumpName& name, const Parts& parts, Stage stage)
     {
         const unsigned count = signalsOf(stage).count;
-        if (count == 1) {
+        if (count <= 1) {
             const bool fits = name.bits == 0 || isWidth(name.bits);
             return fits && place(name.name, stage, passSignals[signalsOf(stage).first].name);
         }
