@@ -1,13 +1,13 @@
 // Programs: the arguments of `morvik` and `morvik-mpi`.
 #include "Programs.h"
 
-#include "Doctor.h"
 #include "Encode.h"
 #include "Trace.h"
 #include "Vectors.h"
 #include "ber/Merge.h"
 #include "compare/Compare.h"
 #include "decode/Decode.h"
+#include "doctor/Doctor.h"
 #include "info/Info.h"
 #include "selftest/SelfTest.h"
 

@@ -1,6 +1,8 @@
 // TransportOptions: the options of subcommands that encode and decode transport blocks.
 #include "TransportOptions.h"
 
+#include <cmath>
+
 #include "Arguments.h"
 #include "Lists.h"
 #include "TransportFit.h"
@@ -33,6 +35,15 @@ std::vector<unsigned> versionsOf(const std::string& text)
     return versions;
 }
 
+float readScale(const std::string& text)
+{
+    const auto scale = base::parseNumber<float>(text);
+    if (!scale || !std::isfinite(*scale) || *scale <= 0) {
+        refuse("--scale", text, "expected a number above 0");
+    }
+    return *scale;
+}
+
 }  // namespace
 
 CLI::Option* addVersionsOption(CLI::App& command,
@@ -41,6 +52,18 @@ CLI::Option* addVersionsOption(CLI::App& command,
 {
     const std::string names = std::string(versionsOption) + ",--redundancy-version";
     return command.add_option_function<std::string>(names, take, description)->type_name("V[,V...]")->default_str("0");
+}
+
+void addScaleOption(CLI::App& command, CLI::Option& transport, float& scale)
+{
+    command
+        .add_option_function<std::string>(
+            "--scale",
+            [&scale](const std::string& text) { scale = readScale(text); },
+            "Soft value for an input of 1: 1 for soft values, more for log-likelihood ratios")
+        ->type_name("S")
+        ->default_str("1")
+        ->needs(&transport);
 }
 
 void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOptions& options)

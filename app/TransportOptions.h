@@ -30,6 +30,9 @@ CLI::Option* addVersionsOption(CLI::App& command,
 /// Adds --coded-bits, --modulation, --redundancy-versions and --soft-buffer-size, which all need `transport`.
 void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOptions& options);
 
+/// Adds --scale, which needs `transport`.
+void addScaleOption(CLI::App& command, CLI::Option& transport, float& scale);
+
 /// The code for transport blocks of `bits` bits. Throws base::Error as checkFit() does.
 link::TransportBlockCode transportBlockCode(std::uint32_t bits,
                                             const TransportOptions& options,

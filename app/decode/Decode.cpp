@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <chrono>
-#include <cmath>
 #include <cstdint>
 #include <iostream>
 #include <memory>
@@ -20,7 +19,6 @@
 #include "TransportDecode.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
-#include "base/Numbers.h"
 #include "base/Text.h"
 #include "hardware/testbench/Decoder.h"
 
@@ -178,15 +176,6 @@ int decode(const Options& options)
     return summary.bitErrors > 0 ? differencesFound : success;
 }
 
-float readScale(const std::string& text)
-{
-    const auto scale = base::parseNumber<float>(text);
-    if (!scale || !std::isfinite(*scale) || *scale <= 0) {
-        refuse("--scale", text, "expected a number above 0");
-    }
-    return *scale;
-}
-
 TransportDecodeOptions transportOptions(const Options& options)
 {
     TransportDecodeOptions transport = options.transport;
@@ -233,14 +222,7 @@ void addTransportDecodeOptions(CLI::App& command, TransportDecodeOptions& option
         size->excludes(command.get_option(other));
     }
     addTransportOptions(command, *size, options.transport);
-    command
-        .add_option_function<std::string>(
-            "--scale",
-            [&options](const std::string& text) { options.scale = readScale(text); },
-            "Soft value for an input of 1: 1 for soft values, more for log-likelihood ratios")
-        ->type_name("S")
-        ->default_str("1")
-        ->needs(size);
+    addScaleOption(command, *size, options.scale);
     command
         .add_option("--soft-buffer-bits",
                     options.softBufferBits,

@@ -12,23 +12,6 @@ namespace {
 
 constexpr std::size_t shownAttempts = 5;
 
-std::string number(double value, int decimals)
-{
-    char text[64];
-    std::snprintf(text, sizeof text, "%.*f", decimals, value);
-    return text;
-}
-
-std::string percent(const Signs& signs)
-{
-    return number(100 * signs.fraction(), 1) + " %";
-}
-
-std::string right(const std::string& text, std::size_t width)
-{
-    return std::string(width - std::min(width, text.size()), ' ') + text;
-}
-
 /// The mistakes, joined by "and".
 std::string listed(const Mistakes& mistakes)
 {
@@ -44,10 +27,10 @@ std::string row(const Attempt& attempt, std::size_t blocks)
     const std::string decoded = std::to_string(attempt.decoded) + " of " + std::to_string(blocks);
     const std::string undone = attempt.mistakes.count() == 0 ? "none: as it is" : listed(attempt.mistakes);
     if (!attempt.decodable) {
-        return right(decoded, 9) + right("-", 12) + right("-", 13) + "  " + undone + '\n';
+        return rightAligned(decoded, 9) + rightAligned("-", 12) + rightAligned("-", 13) + "  " + undone + '\n';
     }
-    return right(decoded, 9) + right(std::to_string(attempt.wrongBits), 12) + right(percent(attempt.signs), 13) + "  " +
-           undone + '\n';
+    return rightAligned(decoded, 9) + rightAligned(std::to_string(attempt.wrongBits), 12) +
+           rightAligned(percent(attempt.signs), 13) + "  " + undone + '\n';
 }
 
 bool isSame(const Mistakes& a, const Mistakes& b)
@@ -85,7 +68,7 @@ std::string appearanceText(const Diagnosis& diagnosis)
     const Appearance& appearance = diagnosis.appearance;
     std::string text = "Wrong signs: rsc1_sys " + percent(appearance.streams[0]) + ", rsc1_par " +
                        percent(appearance.streams[1]) + ", rsc2_par " + percent(appearance.streams[2]) + ", tail " +
-                       percent(appearance.tail) + ".\nAmplitude: " + number(appearance.amplitude, 1) +
+                       percent(appearance.tail) + ".\nAmplitude: " + fixed(appearance.amplitude, 1) +
                        " in the file; 8 suits algorithm types 0 and 1 (docs/scale.md).";
     const bool isFarOff = std::abs(std::log2(std::max(appearance.amplitude, 1e-3) / 8)) > 1.5;
     text += isFarOff ? " This is far from it and costs error rate." : "";
@@ -108,7 +91,7 @@ std::string strangerText(const Diagnosis& diagnosis)
 std::string noiseText(const Diagnosis& diagnosis)
 {
     const Noise& noise = *diagnosis.noise;
-    return "The noise is that of Eb/N0 = " + number(noise.ebn0, 1) + " dB, where " + std::to_string(noise.failed) +
+    return "The noise is that of Eb/N0 = " + fixed(noise.ebn0, 1) + " dB, where " + std::to_string(noise.failed) +
            " of " + std::to_string(noise.simulated) + " simulated blocks of " + std::to_string(noise.blockSize) +
            " bits fail.\n";
 }
@@ -145,27 +128,6 @@ std::string verdictText(const Diagnosis& diagnosis)
            "to these blocks?\n";
 }
 
-const char* nameOf(Verdict verdict)
-{
-    switch (verdict) {
-    case Verdict::healthy:
-        return "healthy";
-    case Verdict::mistaken:
-        return "mistaken";
-    case Verdict::careless:
-        return "careless";
-    case Verdict::strange:
-        return "strange";
-    case Verdict::noisy:
-        return "noisy";
-    case Verdict::unexplained:
-        return "unexplained";
-    case Verdict::unrelated:
-        break;
-    }
-    return "unrelated";
-}
-
 nlohmann::ordered_json mistakesOf(const Mistakes& mistakes)
 {
     nlohmann::ordered_json list = nlohmann::ordered_json::array();
@@ -191,6 +153,44 @@ nlohmann::ordered_json attemptOf(const Attempt& attempt)
 }
 
 }  // namespace
+
+std::string fixed(double value, int decimals)
+{
+    char text[64];
+    std::snprintf(text, sizeof text, "%.*f", decimals, value);
+    return text;
+}
+
+std::string percent(const Signs& signs)
+{
+    return fixed(100 * signs.fraction(), 1) + " %";
+}
+
+std::string rightAligned(const std::string& text, std::size_t width)
+{
+    return std::string(width - std::min(width, text.size()), ' ') + text;
+}
+
+const char* nameOf(Verdict verdict)
+{
+    switch (verdict) {
+    case Verdict::healthy:
+        return "healthy";
+    case Verdict::mistaken:
+        return "mistaken";
+    case Verdict::careless:
+        return "careless";
+    case Verdict::strange:
+        return "strange";
+    case Verdict::noisy:
+        return "noisy";
+    case Verdict::unexplained:
+        return "unexplained";
+    case Verdict::unrelated:
+        break;
+    }
+    return "unrelated";
+}
 
 std::string textOf(const Diagnosis& diagnosis)
 {

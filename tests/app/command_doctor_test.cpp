@@ -194,6 +194,80 @@ TEST_F(Doctor, LooksAtBlocksOfSeveralSizes)
     EXPECT_TRUE(has(result.out, "4 of 4")) << result.out;
 }
 
+// ---- Transport blocks
+
+TEST_F(Doctor, TellsMistakesOfTransportBlocks)
+{
+    std::string bits;
+    for (unsigned i = 0; i < 1000; ++i) {
+        bits += i % 7 % 2 != 0 ? '1' : '0';
+    }
+    morvik.write("sent.bits", bits + '\n' + std::string(bits.rbegin(), bits.rend()) + '\n');
+    const auto encode = [this](const std::string& versions) {
+        morvik.run({"encode",
+                    "sent.bits",
+                    "--transport-block",
+                    "--coded-bits",
+                    "2000",
+                    "--redundancy-version",
+                    versions,
+                    "--amplitude",
+                    "8",
+                    "--output",
+                    "coded.csv"});
+    };
+    const auto examineCoded = [this](const std::vector<std::string>& options) {
+        std::vector<std::string> arguments = {
+            "doctor", "coded.csv", "--transport-block-size", "1000", "--coded-bits", "2000"};
+        arguments.insert(arguments.end(), options.begin(), options.end());
+        return morvik.run(arguments);
+    };
+    encode("0,2");
+    const CommandResult right = examineCoded({"--reference", "sent.bits", "--redundancy-version", "0,2"});
+    EXPECT_EQ(right.status, 0) << right.out;
+    EXPECT_TRUE(has(right.out, "Healthy: all transport blocks decode unchanged.\n")) << right.out;
+    const CommandResult first = examineCoded({"--redundancy-version", "0,2", "--blocks", "1"});
+    EXPECT_EQ(first.status, 0) << first.out;
+    EXPECT_TRUE(has(first.out, "Looked at the first transport block only: the file has more; use --blocks N.\n"));
+    encode("2");
+    for (const std::vector<std::string>& options : {std::vector<std::string>{"--reference", "sent.bits"}, {}}) {
+        const CommandResult wrong = examineCoded(options);
+        EXPECT_EQ(wrong.status, 1);
+        EXPECT_TRUE(has(wrong.out,
+                        "Found: transmission 1 has redundancy version 2, not 0.\n  Say so in --redundancy-version, or "
+                        "send version 0.\nAll transport blocks decode once this is fixed.\n"))
+            << wrong.out;
+    }
+    const auto json = nlohmann::json::parse(examineCoded({"--json"}).out);
+    EXPECT_EQ(json.at("verdict"), "mistaken");
+    EXPECT_EQ(json.at("known_blocks"), 2);
+    EXPECT_EQ(json.at("mistakes")[0].at("name"), "version");
+    EXPECT_EQ(json.at("decoded"), 2);
+}
+
+TEST_F(Doctor, RefusesTransportBlocksThatCannotBe)
+{
+    morvik.write("coded.csv", "block,soft_values\n0,1,2,3,4\n0,1,2,3,4\n");
+    morvik.write("sent.bits", "01\n");
+    const auto refused = [this](const std::vector<std::string>& options, const std::string& line) {
+        std::vector<std::string> arguments = {"doctor", "coded.csv", "--transport-block-size", "1"};
+        arguments.insert(arguments.end(), options.begin(), options.end());
+        expectRefusal(morvik.run(arguments), line);
+    };
+    refused(
+        {"--coded-bits", "5"},
+        "transport block of 1 bits, --coded-bits 5, --modulation qpsk: 5 coded bits are no multiple of the 2 bits of "
+        "a symbol, 4 and 6 are");
+    refused({"--coded-bits", "6"}, "coded.csv:2: 4 values, expected the 6 of --coded-bits");
+    refused({"--coded-bits", "4"}, "coded.csv:3: block 0 has more rows than --redundancy-version has numbers, 1");
+    refused({"--coded-bits", "4", "--redundancy-version", "0,1", "--reference", "sent.bits"},
+            "sent.bits:1: 2 bits, expected the 1 of --transport-block-size");
+    morvik.write("coded.csv", "block,soft_values\n");
+    refused({"--coded-bits", "4"}, "coded.csv:1: no rows after the header, expected at least one transmission");
+    const CommandResult alone = morvik.run({"doctor", "coded.csv", "--reference", "sent.bits", "--coded-bits", "4"});
+    EXPECT_EQ(alone.err, "morvik doctor: --coded-bits requires --transport-block-size; see 'morvik doctor --help'\n");
+}
+
 TEST_F(Doctor, ReadsStandardInput)
 {
     morvik.write("in.bits", bitText(sentFrames(40, 1, 6, 1)));

@@ -13,6 +13,7 @@
 #include "Notice.h"
 #include "ReferenceBits.h"
 #include "SoftValueReader.h"
+#include "TransportDoctor.h"
 #include "base/InputFile.h"
 #include "hardware/diagnosis/Diagnosis.h"
 #include "hardware/diagnosis/DiagnosisText.h"
@@ -23,14 +24,13 @@ namespace morvik {
 
 namespace {
 
-constexpr int noMistakeFound = 3;  // an exit status of this subcommand only
-
 struct Options {
     std::string input = base::standardStream;
     std::string reference;
     std::uint32_t blocks = 16;
     bool json = false;
     DecoderOptions decoder;
+    TransportDoctorOptions transport;  ///< bits is 0 for code blocks; what it shares with code blocks is above
 };
 
 void check(const diagnosis::Case& read, const SoftValueReader& blocks, const ReferenceBits& reference)
@@ -78,17 +78,29 @@ int examine(const Options& options)
     diagnosis.hasMore = read.hasMore;
     const std::string core = coreLine(options.decoder.generics, options.decoder.iterations);
     print(options.json ? jsonOf(diagnosis) : core + textOf(diagnosis));
-    switch (diagnosis.verdict) {
-    case diagnosis::Verdict::healthy:
-        return success;
-    case diagnosis::Verdict::mistaken:
-    case diagnosis::Verdict::careless:
-        return differencesFound;
-    default:
-        return diagnosis.verdict != diagnosis::Verdict::unrelated && diagnosis.best.mistakes.count() > 0
-                   ? differencesFound
-                   : noMistakeFound;
-    }
+    return statusOf(diagnosis.verdict, diagnosis.best.mistakes.count());
+}
+
+int examineTransportBlocks(const Options& options)
+{
+    TransportDoctorOptions transport = options.transport;
+    transport.input = options.input;
+    transport.reference = options.reference;
+    transport.blocks = options.blocks;
+    transport.json = options.json;
+    transport.decoder = options.decoder;
+    return examineTransportBlocks(transport);
+}
+
+void addTransportDoctorOptions(CLI::App& command, TransportDoctorOptions& options)
+{
+    CLI::Option* const size =
+        command
+            .add_option("--transport-block-size", options.bits, "FILE has transmissions of transport blocks of A bits")
+            ->transform(integerFrom(1, link::mostTransportBits))
+            ->type_name("A");
+    addTransportOptions(command, *size, options.transport);
+    addScaleOption(command, *size, options.scale);
 }
 
 }  // namespace
@@ -102,16 +114,21 @@ Command addDoctor(CLI::App& app)
         ->type_name("")
         ->capture_default_str();
     command->add_option("--reference", options->reference, "Bits that were sent, one line for each block")
-        ->type_name("FILE")
-        ->required();
+        ->type_name("FILE");
     command->add_option("--blocks", options->blocks, "Look at the first N blocks")
         ->transform(integerFrom(1, 1000))
         ->type_name("N")
         ->capture_default_str();
     command->add_flag("--json", options->json, "Print a JSON object instead of text");
     addDecoderOptions(*command, options->decoder);
+    addTransportDoctorOptions(*command, options->transport);
     command->footer(R"(Looks for flipped signs, swapped columns, a wrong tail order, reversed rows or bits, a missing or
 doubled scale, missing or extra rows, and combinations of these.
+
+With --transport-block-size and the other options of 'morvik decode' for transport blocks, looks for
+mistakes of the LTE chain: another redundancy version or soft buffer, filler bits taken as data, a
+wrong interleaver, circular buffer or division over code blocks, the order and signs of a symbol's
+bits, a scale that does not fit. Without --reference, CRCs tell which bits are right.
 
 Exit status: 0 all blocks decode and nothing is wrong, 1 a mistake was found, 2 bad input or usage,
 3 blocks fail but no mistake was found: too much noise, or bits of other blocks.
@@ -119,8 +136,13 @@ Exit status: 0 all blocks decode and nothing is wrong, 1 a mistake was found, 2 
 Example:
   morvik doctor received.csv --reference sent.bits)");
 
+    command->callback([options] {
+        if (options->reference.empty() && options->transport.bits == 0) {
+            throw CLI::RequiredError("--reference");
+        }
+    });
     const auto run = [options] {
-        return examine(*options);
+        return options->transport.bits > 0 ? examineTransportBlocks(*options) : examine(*options);
     };
     return {command, run};
 }

@@ -1,6 +1,6 @@
 // Doctor: the subcommand that diagnoses why blocks decode badly.
-#ifndef MORVIK_APP_DOCTOR_H
-#define MORVIK_APP_DOCTOR_H
+#ifndef MORVIK_APP_DOCTOR_DOCTOR_H
+#define MORVIK_APP_DOCTOR_DOCTOR_H
 
 #include "Command.h"
 
