@@ -22,6 +22,8 @@ constexpr double enoughDoublings = 1;
 constexpr double enoughByAmplitude = 3;
 /// Standard deviations by which signs must beat chance to be related to the bits.
 constexpr double related = 5;
+/// Wrong signs that ratios promise for each wrong one: about one in noise, more if strong values are wrong.
+constexpr double contradictory = 1.3;
 constexpr std::size_t likelyAttempts = 6;
 constexpr std::size_t blocksTriedByCrc = 2;
 constexpr std::uint32_t simulatedBlocks = 100;
@@ -119,8 +121,10 @@ private:
             itsCases.begin() + static_cast<std::ptrdiff_t>(std::min(itsCases.size(), blocksTriedByCrc)));
         for (const bool inPairs : {false, true}) {
             for (const ChainMistakes& mistakes : combinationsOf(kindsToTry(itsFormat), inPairs)) {
-                if (itsTrial.decode(first, mistakes).decoded > 0) {
-                    findBits(mistakes);
+                const bool isLikely = std::any_of(first.begin(), first.end(), [&](const ChainCase& each) {
+                    return itsTrial.fitsAtFirst(each, mistakes);
+                });
+                if (isLikely && findBits(mistakes)) {
                     return;
                 }
             }
@@ -161,8 +165,14 @@ private:
             asIs = evidence.asTold();
         }
         std::sort(all.begin(), all.end(), byCost);
-        // With another soft buffer, alone or beside the likeliest mistakes.
-        std::vector<ChainSuspicion> withBuffers = {evidence.withBuffer(asIs)};
+        // With another soft buffer, alone, with each redundancy version, or beside the likeliest mistakes.
+        std::vector<ChainSuspicion> withBuffers;
+        for (unsigned version = 0; version < link::redundancyVersions; ++version) {
+            ChainSuspicion other = asIs;
+            other.mistakes.versions = itsFormat.versions;
+            other.mistakes.versions.front() = version;
+            withBuffers.push_back(evidence.withBuffer(other));
+        }
         for (std::size_t i = 0; i < std::min<std::size_t>(all.size(), 2); ++i) {
             withBuffers.push_back(evidence.withBuffer(all[i]));
         }
@@ -255,6 +265,9 @@ private:
             diagnosis.verdict = diagnosis.best.mistakes.count(itsFormat) > 0 ? Verdict::careless : Verdict::healthy;
         } else if (diagnosis.best.decoded == diagnosis.blocks) {
             diagnosis.verdict = Verdict::mistaken;
+        } else if (diagnosis.strength.promised > contradictory * diagnosis.strength.wrong) {
+            diagnosis.isContradictory = true;
+            diagnosis.verdict = Verdict::unexplained;
         } else {
             ChainNoise noise;
             noise.esn0 = esn0Of(itsFormat.modulation, diagnosis.best.signs.fraction());

@@ -39,7 +39,8 @@ struct ChainDiagnosis {
     Strength strength;                   ///< of the values, once the mistakes are undone
     double steps = 0;                    ///< of the core for a ratio of 1, or 0 if that is not known
     double suitableSteps = 0;            ///< what suits instead
-    std::optional<ChainNoise> noise;     ///< where blocks fail
+    bool isContradictory = false;        ///< strong values are wrong too often for noise
+    std::optional<ChainNoise> noise;     ///< where blocks fail, and noise may be why
 };
 
 /// Looks for mistakes that explain the cases, of which there must be at least one. `scale` is the core's steps for a

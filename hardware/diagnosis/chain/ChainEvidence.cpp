@@ -313,6 +313,10 @@ Strength strengthOf(const std::vector<float>& values)
         (slope(middle) > 0 ? low : high) = middle;
     }
     strength.unit = 1 / low;
+    strength.wrong = static_cast<double>(wrong) / static_cast<double>(values.size());
+    for (const float value : values) {
+        strength.promised += 1 / (1 + std::exp(low * std::abs(value))) / static_cast<double>(values.size());
+    }
     return strength;
 }
 

@@ -77,7 +77,9 @@ private:
 /// What the values say of their scale.
 struct Strength {
     double meanAmplitude = 0;
-    double unit = 0;  ///< the value that says a log-likelihood ratio of 1, or 0 where too few signs are wrong to tell
+    double unit = 0;      ///< the value that says a log-likelihood ratio of 1; 0: too few signs are wrong to tell
+    double wrong = 0;     ///< fraction of signs that are wrong,
+    double promised = 0;  ///< and what the ratios promise, which is as many in any noise
 };
 
 /// The sent value of each received one: the value, negated where its bit is 0, with the mistakes undone.

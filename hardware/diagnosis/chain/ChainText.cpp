@@ -82,6 +82,11 @@ std::string verdictText(const ChainDiagnosis& diagnosis)
         return "Too noisy: " + failures + (isMistaken ? " even then" : ", and no mistake explains it") + ".\n" +
                noiseText();
     case Verdict::unexplained:
+        if (diagnosis.isContradictory) {
+            return "Not explained: " + failures + (isMistaken ? " even then" : "") +
+                   ", and strong values are wrong too often for noise. Is there another order of bits or symbols, or a "
+                   "burst?\n";
+        }
         return "Not explained: " + failures + (isMistaken ? " even then" : " for another reason") +
                ", which noise of this strength hardly ever causes.\n" + noiseText();
     case Verdict::strange:
@@ -96,6 +101,9 @@ std::string verdictText(const ChainDiagnosis& diagnosis)
 
 std::string scaleText(const ChainDiagnosis& diagnosis)
 {
+    if (diagnosis.isContradictory) {
+        return "";
+    }
     if (diagnosis.steps <= 0) {
         return "Scale: too few signs are wrong to tell what the values mean.\n";
     }

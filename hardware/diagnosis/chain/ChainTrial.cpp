@@ -44,17 +44,11 @@ std::vector<std::uint8_t> ChainTrial::bitsOf(const ChainCase& one, const ChainMi
 bool ChainTrial::decode(const ChainCase& one, const ChainMistakes& mistakes)
 {
     const link::CodeBlocks& blocks = itsCode.blocks();
-    Buffers sums;
-    for (unsigned r = 0; r < blocks.count; ++r) {
-        sums.emplace_back(3 * (blocks.size(r) + rules::tailPositions));
-    }
-    std::vector<std::uint8_t> decisions;
+    std::vector<std::vector<float>> sums(blocks.count);
     for (std::size_t t = 0; t < one.rows.size(); ++t) {
-        receive(one.rows[t], t, mistakes, sums);
         for (unsigned r = 0; r < blocks.count; ++r) {
-            const double scale = std::ldexp(itsScale, -mistakes.doublings);
-            itsDecoder.decode(softBlock(r, sums[r], scale), itsIterations, 0, decisions);
-            itsCode.join(decisions.data(), r, itsRow.data());
+            receive(one, t, mistakes, r, sums[r]);
+            decodeBlock(r, sums[r], mistakes);
         }
         link::unpackBits(itsRow.data(), itsBits.size(), itsBits.data());
         if (one.sent.empty() ? itsCode.fits(itsRow.data()) : itsBits == one.sent) {
@@ -64,23 +58,44 @@ bool ChainTrial::decode(const ChainCase& one, const ChainMistakes& mistakes)
     return false;
 }
 
-/// Adds a transmission to the soft buffers.
-void ChainTrial::receive(const std::vector<float>& row,
+bool ChainTrial::fitsAtFirst(const ChainCase& one, const ChainMistakes& mistakes)
+{
+    std::vector<float> sums;
+    for (std::size_t t = 0; t < one.rows.size(); ++t) {
+        receive(one, t, mistakes, 0, sums);
+        if (decodeBlock(0, sums, mistakes)) {
+            return true;
+        }
+    }
+    return false;
+}
+
+/// Decodes code block r into its part of itsRow. Returns whether its CRC fits.
+bool ChainTrial::decodeBlock(unsigned r, const std::vector<float>& sums, const ChainMistakes& mistakes)
+{
+    itsDecoder.decode(softBlock(r, sums, std::ldexp(itsScale, -mistakes.doublings)), itsIterations, 0, itsDecisions);
+    return itsCode.join(itsDecisions.data(), r, itsRow.data());
+}
+
+/// Adds a transmission to the soft buffer of code block r: its streams, one after the other.
+void ChainTrial::receive(const ChainCase& one,
                          std::size_t transmission,
                          const ChainMistakes& mistakes,
-                         Buffers& sums)
+                         unsigned r,
+                         std::vector<float>& sums) const
 {
-    const std::vector<float> values = restoredSymbols(row, itsFormat.modulation, mistakes);
-    const std::vector<Part> parts = partsOf(itsCode, mistakes.split);
-    const unsigned version = (mistakes.versions.empty() ? itsFormat.versions : mistakes.versions)[transmission];
     const link::CodeBlocks& blocks = itsCode.blocks();
-    for (unsigned r = 0; r < blocks.count; ++r) {
-        const WholeBuffer whole(blocks.size(r), blocks.fillersOf(r), mistakes);
-        const CircularBuffer buffer = whole.limited(bufferSizeOf(itsFormat, mistakes, blocks.count, whole.size()));
-        for (std::size_t i = 0; i < parts[r].count && !buffer.places.empty(); ++i) {
-            const std::size_t place = (buffer.starts.at(version) + i) % buffer.places.size();
-            sums[r][buffer.places[place]] += values[parts[r].first + i];
-        }
+    const Part part = partsOf(itsCode, mistakes.split)[r];
+    const auto first = one.rows[transmission].begin() + static_cast<std::ptrdiff_t>(part.first);
+    // Code blocks are sent in whole symbols.
+    const std::vector<float> values = restoredSymbols(
+        std::vector<float>(first, first + static_cast<std::ptrdiff_t>(part.count)), itsFormat.modulation, mistakes);
+    const unsigned version = (mistakes.versions.empty() ? itsFormat.versions : mistakes.versions)[transmission];
+    const WholeBuffer whole(blocks.size(r), blocks.fillersOf(r), mistakes);
+    const CircularBuffer buffer = whole.limited(bufferSizeOf(itsFormat, mistakes, blocks.count, whole.size()));
+    sums.resize(std::size_t{3} * (blocks.size(r) + rules::tailPositions));
+    for (std::size_t i = 0; i < values.size() && !buffer.places.empty(); ++i) {
+        sums[buffer.places[(buffer.starts.at(version) + i) % buffer.places.size()]] += values[i];
     }
 }
 

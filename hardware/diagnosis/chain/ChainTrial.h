@@ -26,14 +26,19 @@ public:
     };
     Result decode(const std::vector<ChainCase>& cases, const ChainMistakes& mistakes);
 
+    /// Whether the CRC of a transport block's first code block fits once the mistakes are undone.
+    bool fitsAtFirst(const ChainCase& one, const ChainMistakes& mistakes);
+
     /// The bits of a transport block whose CRC fits once the mistakes are undone; empty if it does not.
     std::vector<std::uint8_t> bitsOf(const ChainCase& one, const ChainMistakes& mistakes);
 
 private:
-    /// The soft buffer of each code block: its streams, one after the other.
-    using Buffers = std::vector<std::vector<float>>;
-
-    void receive(const std::vector<float>& row, std::size_t transmission, const ChainMistakes& mistakes, Buffers& sums);
+    void receive(const ChainCase& one,
+                 std::size_t transmission,
+                 const ChainMistakes& mistakes,
+                 unsigned r,
+                 std::vector<float>& sums) const;
+    bool decodeBlock(unsigned r, const std::vector<float>& sums, const ChainMistakes& mistakes);
     SoftBlock softBlock(unsigned r, const std::vector<float>& sums, double scale) const;
     bool decode(const ChainCase& one, const ChainMistakes& mistakes);
 
@@ -45,6 +50,7 @@ private:
     Decoder itsDecoder;
     std::vector<std::uint64_t> itsRow;  // decided last
     std::vector<std::uint8_t> itsBits;  // its first A bits
+    std::vector<std::uint8_t> itsDecisions;
 };
 
 /// The Es/N0 of white Gaussian noise, in decibels, that makes a fraction of the signs wrong.

@@ -3,9 +3,13 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <iterator>
 #include <set>
 
 #include "hardware/diagnosis/chain/ChainText.h"
+#include "link/SymbolLink.h"
+#include "link/coding/PackedBits.h"
 #include "link/coding/RateMatching.h"
 #include "support/ChainSender.h"
 
@@ -245,6 +249,38 @@ TEST(ChainDiagnosis, NamesWhatTheValuesCannotTellApart)
     ASSERT_EQ(diagnosis.equals.size(), 1U) << textOf(diagnosis);
     EXPECT_EQ(diagnosis.equals[0].bufferSize.to, 48U * 33);
     EXPECT_NE(textOf(diagnosis).find("Or: the circular buffer has N_cb = "), std::string::npos) << textOf(diagnosis);
+}
+
+/// Over symbols, values are of different strength, so that wrong ones stand out.
+TEST(ChainDiagnosis, DoesNotBlameNoiseForAnOrderThatItDoesNotKnow)
+{
+    const ChainSender sender = senderOf(2001, 6000, 6, {0});
+    const std::vector<unsigned> order = {2, 0, 1, 3, 4, 5};
+    std::vector<ChainCase> cases = casesOf(sender, 2, 0.01, 1);
+    link::SymbolLink channel({link::Modulation::qam64, link::Fading::none, link::Demapper::maxLog, 17000},
+                             link::randomKey(1),
+                             link::samplerForms().front());
+    for (std::size_t i = 0; i < cases.size(); ++i) {
+        std::vector<float>& row = cases[i].rows.front();
+        const std::vector<std::uint8_t> bits = [&row] {
+            std::vector<std::uint8_t> ones;
+            std::transform(row.begin(), row.end(), std::back_inserter(ones), [](float value) {
+                return static_cast<std::uint8_t>(value > 0 ? 1 : 0);
+            });
+            return ones;
+        }();
+        std::vector<std::uint64_t> packed(link::wordsOf(bits.size()));
+        link::packBits(bits.data(), bits.size(), packed.data());
+        std::vector<float> ratios(row.size());
+        channel.receive(i, 0, packed.data(), row.size(), ratios.data());
+        for (std::size_t k = 0; k < row.size(); ++k) {
+            row[k] = ratios[k - k % 6 + order[k % 6]];
+        }
+    }
+    const ChainDiagnosis diagnosis = examined(cases, formatOf(sender));
+    EXPECT_EQ(diagnosis.verdict, Verdict::unexplained) << textOf(diagnosis);
+    EXPECT_EQ(found(diagnosis), std::set<Names>{Names{}});
+    EXPECT_NE(textOf(diagnosis).find("strong values are wrong too often for noise"), std::string::npos);
 }
 
 TEST(ChainDiagnosis, TellsWhenBitsBelongToOtherBlocks)
