@@ -151,7 +151,7 @@ ChainSuspicion ChainEvidence::judged(const Tally& tally, double weight) const
     long long sum = 0;
     for (std::size_t t = 0; t < versions.size(); ++t) {
         const auto& sums = tally.sums[t];
-        const auto best = std::max_element(sums.begin(), sums.end());
+        const auto* const best = std::max_element(sums.begin(), sums.end());
         if (weight * static_cast<double>(*best - sums.at(versions[t])) / 2 > enoughForVersion) {
             versions[t] = static_cast<unsigned>(best - sums.begin());
         }

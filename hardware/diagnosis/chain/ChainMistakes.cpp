@@ -375,7 +375,7 @@ std::vector<Explanation> explain(const ChainMistakes& mistakes, const ChainForma
 }
 
 WholeBuffer::WholeBuffer(unsigned K, unsigned fillers, const ChainMistakes& mistakes)
-    : itsRows((K + rules::tailPositions + columns - 1) / columns), itHasOffset(!mistakes.noOffset), itsBefore{0}
+    : itsRows((K + rules::tailPositions + columns - 1) / columns), itsHasOffset(!mistakes.noOffset), itsBefore{0}
 {
     const unsigned length = K + rules::tailPositions;
     const unsigned size = columns * itsRows;
@@ -400,7 +400,7 @@ std::array<unsigned, link::redundancyVersions> WholeBuffer::starts(unsigned size
     std::array<unsigned, link::redundancyVersions> starts{};
     for (unsigned version = 0; version < starts.size(); ++version) {
         const unsigned eighths = (size + 8 * itsRows - 1) / (8 * itsRows);
-        const unsigned k0 = itsRows * (2 * eighths * version + (itHasOffset ? 2 : 0));
+        const unsigned k0 = itsRows * (2 * eighths * version + (itsHasOffset ? 2 : 0));
         starts[version] = itsBefore[k0 % size] % std::max(itsBefore[size], 1U);
     }
     return starts;

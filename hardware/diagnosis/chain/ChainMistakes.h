@@ -145,7 +145,7 @@ public:
 
 private:
     unsigned itsRows;  // of the sub-block interleaver
-    bool itHasOffset;
+    bool itsHasOffset;
     std::vector<std::uint16_t> itsPlaces;
     std::vector<unsigned> itsBefore;  // bits before each position
 };
