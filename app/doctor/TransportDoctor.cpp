@@ -42,7 +42,7 @@ Cases readRows(const TransportDoctorOptions& options, CodedValueReader& rows)
         }
         std::vector<std::vector<float>>& transmissions = read.cases.back().rows;
         if (transmissions.size() == options.transport.versions.size()) {
-            rows.fail("block " + label + " has more rows than --redundancy-version has numbers, " +
+            rows.fail("block " + label + " has more rows than " + versionsOption + " has numbers, " +
                       std::to_string(transmissions.size()));
         }
         transmissions.push_back(rows.values());

@@ -234,7 +234,7 @@ TEST_F(Doctor, TellsMistakesOfTransportBlocks)
         const CommandResult wrong = examineCoded(options);
         EXPECT_EQ(wrong.status, 1);
         EXPECT_TRUE(has(wrong.out,
-                        "Found: transmission 1 has redundancy version 2, not 0.\n  Say so in --redundancy-version, or "
+                        "Found: transmission 1 has redundancy version 2, not 0.\n  Say so in --redundancy-versions, or "
                         "send version 0.\nAll transport blocks decode once this is fixed.\n"))
             << wrong.out;
     }
@@ -254,12 +254,10 @@ TEST_F(Doctor, RefusesTransportBlocksThatCannotBe)
         arguments.insert(arguments.end(), options.begin(), options.end());
         expectRefusal(morvik.run(arguments), line);
     };
-    refused(
-        {"--coded-bits", "5"},
-        "transport block of 1 bits, --coded-bits 5, --modulation qpsk: 5 coded bits are no multiple of the 2 bits of "
-        "a symbol, 4 and 6 are");
+    refused({"--coded-bits", "5"},
+            "--coded-bits 5 is no multiple of the 2 bits of --modulation qpsk, the nearest are 4 and 6");
     refused({"--coded-bits", "6"}, "coded.csv:2: 4 values, expected the 6 of --coded-bits");
-    refused({"--coded-bits", "4"}, "coded.csv:3: block 0 has more rows than --redundancy-version has numbers, 1");
+    refused({"--coded-bits", "4"}, "coded.csv:3: block 0 has more rows than --redundancy-versions has numbers, 1");
     refused({"--coded-bits", "4", "--redundancy-version", "0,1", "--reference", "sent.bits"},
             "sent.bits:1: 2 bits, expected the 1 of --transport-block-size");
     morvik.write("coded.csv", "block,soft_values\n");

@@ -216,7 +216,7 @@ Explanation explainVersion(std::size_t transmission, unsigned sent, unsigned sai
     return {"version",
             "transmission " + std::to_string(transmission + 1) + " has redundancy version " + std::to_string(sent) +
                 ", not " + std::to_string(said),
-            "Say so in --redundancy-version, or send version " + std::to_string(said) + "."};
+            "Say so in --redundancy-versions, or send version " + std::to_string(said) + "."};
 }
 
 Explanation explainBuffer(const ChainMistakes& mistakes, unsigned count)
