@@ -102,7 +102,7 @@ class Bindings(unittest.TestCase):
         self.expect("systemverilog/morvik_pkg.sv",
                     r"int num_pu = (\d), int algorithm = ALGORITHM_(\w+), int tag_width = (\d)",
                     CORE["num_pu"], CORE["algorithm"].upper().replace("-", "_"), CORE["tag_width"])
-        self.expect("systemverilog/morvik_pkg.sv", r"input int iterations = (\d)", CORE["iterations"])
+        self.expect("systemverilog/morvik_pkg.sv", r"input int iterations = (\d)", CORE["iterations"], times=2)
 
     def test_vhdl(self):
         self.expect("vhdl/morvik_pkg.vhd",

@@ -25,11 +25,12 @@ BELOW = {
     "report": "base simulation rules",
     "hardware/testbench": "base rules src",
     "hardware/tables": "base",
-    "hardware/vectors": "base hardware/tables hardware/testbench link link/channel rules",
+    "hardware/vectors": "base hardware/tables hardware/testbench link link/channel link/coding rules simulation",
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
     "hardware/checker": "base hardware/comparison hardware/testbench rules",
     "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
+    "hardware/diagnosis/chain": "base hardware/diagnosis hardware/testbench link link/coding link/modulation rules simulation",
     "validation": "link link/channel link/coding link/modulation link/random rules src",
 }
 

@@ -85,7 +85,8 @@ class Shell:
 def options_of(program, subcommand):
     """What --help tells, before the explanation: the first column of its list."""
     text = subprocess.run([program, subcommand, "--help"], check=True, capture_output=True, text=True).stdout
-    return set(re.findall(r"^  (?:-h,)?(--[a-z0-9-]+)", text, re.MULTILINE))
+    names = re.findall(r"^  (?:-h,)?(--[a-z0-9-]+(?:,--[a-z0-9-]+)*)", text, re.MULTILINE)
+    return {name for list in names for name in list.split(",")}
 
 
 def subcommands_of(program):
@@ -125,7 +126,7 @@ CASES = [
     ("morvik vectors --check ", ["folder"]),
     ("morvik vectors --streams s", ["separate"]),
     ("morvik trace --signals alpha,bet", [f"alpha,beta{i}" for i in ["", *range(8)]]),
-    ("morvik compare --format ", ["csv", "vcd"]),
+    ("morvik compare --format ", ["c", "csv", "memh", "npy", "vcd"]),
     ("morvik info 20", ["200", "208", "2016", "2048"]),
 ]
 
