@@ -117,8 +117,7 @@ TEST_F(VectorSet, ChecksWhatTheManifestTellsOfTransportBlocks)
     };
     const std::string place = "parameters: format 1: ";
     EXPECT_EQ(differenceWithFormat("coded_bits", 9001),
-              place +
-                  "\"coded_bits\" is 9001, coded bits are a multiple of the 4 of a symbol, not 9001");
+              place + "\"coded_bits\" is 9001, coded bits are a multiple of the 4 of a symbol, not 9001");
     EXPECT_EQ(differenceWithFormat("modulation", "8psk"),
               place + "\"modulation\" is \"8psk\", expected a name that 'morvik vectors --help' lists");
     EXPECT_EQ(differenceWithFormat("redundancy_versions", std::vector<int>{4}),
