@@ -87,6 +87,7 @@ EQUIVALENT = {
           ("Wide x[3]", "Wide x[4]"), ("Wide p[3]", "Wide p[4]"), ("Wide q[3]", "Wide q[4]")]),
     ],
     "rules/Cut.h": [
+        ("no block, for any number of units", [("constexpr Cut() : Cut(0, 1)", "constexpr Cut() : Cut(0, 2)")]),
         ("64 to 127 steps have no full row in front of their rest",
          [("itsLength < longestWindow ?", "itsLength <= longestWindow ?")]),
     ],

@@ -511,6 +511,25 @@ TEST(TDecoder3G, WritesNoColumnBeyondTheTrellis)
     }
 }
 
+TEST(TDecoder3G, StartsEachBlockFromTheKnownStateWhateverItDecodedBefore)
+{
+    morvik::blocks::Random random(5);
+    SingleEngine kept;
+    for (const unsigned K : {512U, 40U, 48U, 512U}) {
+        Soft soft(3 * K + 12);
+        for (short& value : soft) {
+            value = static_cast<short>(16 * morvik::blocks::between(random, -128, 127));
+        }
+        SingleEngine fresh;
+        Bits hard;
+        Bits expected;
+        ASSERT_TRUE(fresh.decode(soft, expected, 2));
+        ASSERT_TRUE(kept.decode(soft, hard, 2));
+        EXPECT_EQ(kept.itsLLR, fresh.itsLLR) << K;
+        EXPECT_EQ(hard, expected) << K;
+    }
+}
+
 TEST(TDecoder3G, CountsErrorsIterationByIteration)
 {
     morvik::blocks::Random random(4);
