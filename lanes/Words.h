@@ -93,6 +93,8 @@ struct Eighths {
         return {(a.v & ~mask.v) | (b.v & mask.v)};
     }
 
+    // What rules/Trellis.h asks of a value type. Its words wrap; these cannot, so a plain maximum decides (Bounds.h).
+
     friend MORVIK_INLINE Eighths addWrap(Eighths a, Eighths b)
     {
         return a + b;

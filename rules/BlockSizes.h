@@ -1,5 +1,4 @@
-// BlockSizes: the block sizes of the LTE turbo code and their interleaver coefficients, shared by the model and the
-// simulation's encoder.
+// BlockSizes: the block sizes of the LTE turbo code and their interleaver coefficients.
 #ifndef MORVIK_RULES_BLOCKSIZES_H
 #define MORVIK_RULES_BLOCKSIZES_H
 

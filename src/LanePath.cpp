@@ -4,6 +4,7 @@
 #include "CoreInputs.h"
 #include "TCalculationEngineModBase.h"
 #include "rules/Cut.h"
+#include "rules/Schedule.h"
 
 using morvik::simulation_call::Batch;
 using morvik::simulation_call::Status;
@@ -138,7 +139,7 @@ void LanePath::loadClipped(const Batch& batch, std::size_t first)
 
 Status LanePath::decode(unsigned iterations)
 {
-    itsLanes->decode(0, 2 * iterations);
+    itsLanes->decode(0, morvik::rules::halfIterations(iterations));
     count(iterations);
     return morvik::simulation_call::success;
 }
@@ -148,7 +149,7 @@ Status LanePath::countErrors(unsigned iterations, const std::uint8_t* sent, std:
     const std::size_t K = blockSize();
     std::vector<std::uint8_t> bits(itsTaken * K);
     for (unsigned t = 0; t < iterations; ++t) {
-        itsLanes->decode(2 * t, 2 * t + 2);
+        itsLanes->decode(morvik::rules::halfIterations(t), morvik::rules::halfIterations(t + 1));
         decisions(bits.data());
         for (std::size_t b = 0; b < itsTaken; ++b) {
             morvik::lanes::setValueAt(errors, b * iterations + t, differences(&bits[b * K], sent + b * K, K));

@@ -100,14 +100,14 @@ bool haveTheirTypes(const State& state)
            (engine == typeid(TCalculationEngineMod) || engine == typeid(TCalculationEngineModHash));
 }
 
-/// Differences of this many steps or more have no correction (rule 9).
-constexpr int correctedSteps = 64;
+/// Differences of this many eighths or more have no correction (rule 9).
+constexpr int correctedEighths = 64;
 
 /// The non-zero range of the engine's three correction tables.
 std::vector<unsigned char> correctionsOf(const State& state)
 {
     const unsigned char* const anchor = static_cast<const TCalculationEngineModBase&>(*state.engine).itsAlphaLUT;
-    const int reach = correctedSteps << state.state_format->itsShift;
+    const int reach = correctedEighths << state.state_format->itsShift;
     return anchor == nullptr ? std::vector<unsigned char>()
                              : std::vector<unsigned char>(anchor - reach, anchor + reach);
 }

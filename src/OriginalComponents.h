@@ -31,7 +31,7 @@ public:
 
     /// Whether the state still holds these components, unchanged. Cheap, since it is called for each block: skips the
     /// tables that decoder and interleaver cache for a block size, and checks correction tables only for differences
-    /// below 64 steps, beyond which the hardware has no corrections.
+    /// below 64 eighths, beyond which the hardware has no corrections.
     bool areIn(const State& state) const;
 
     /// Drops the tables that decoder and interleaver cache for other block sizes, which a decode of K bits would

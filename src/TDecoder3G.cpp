@@ -74,7 +74,7 @@ bool TDecoder3G::decode(const std::vector<short>& soft,
     }
     blockErrors.resize(std::max(blockErrors.size(), bitErrors.size()));
     for (std::size_t iteration = 0; iteration < bitErrors.size(); ++iteration) {
-        const auto h = static_cast<unsigned>(2 * iteration);
+        const unsigned h = rules::halfIterations(static_cast<unsigned>(iteration));
         if (!calcSISO(h) || !calcSISO(h + 1)) {
             return false;
         }
@@ -94,7 +94,8 @@ bool TDecoder3G::decode(const std::vector<short>& soft, std::vector<unsigned cha
         return false;
     }
     for (unsigned iteration = 0; iteration < iterations; ++iteration) {
-        if (!calcSISO(2 * iteration) || !calcSISO(2 * iteration + 1)) {
+        const unsigned h = rules::halfIterations(iteration);
+        if (!calcSISO(h) || !calcSISO(h + 1)) {
             return false;
         }
     }

@@ -16,7 +16,7 @@ public:
     std::uint32_t itsNBits;  ///< bits of the format, sign included; 1 to 16 when made by create
     std::uint32_t itsBinPt;  ///< fraction bits
     std::uint32_t itsShift;  ///< 16 - bits: the left shift that aligns a value
-    std::uint32_t itsScale;  ///< 2^fraction bits: steps to one
+    std::uint32_t itsScale;  ///< 2^fraction bits: the integer of the number 1
     short itsMin;            ///< most negative value, aligned
     short itsMax;            ///< most positive value, aligned
     std::int32_t itsMinQ;    ///< most negative value as an integer
