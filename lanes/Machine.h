@@ -8,7 +8,7 @@
 //   tileHalves              halves of the widest tile that it transposes efficiently (Transpose.h)
 //   Permutation<count>      gathers a vector with permuted lanes
 //   Table<count>            looks up a table of sixteen values in each lane
-//   scaledHalf(a)           floor(3 a / 8), for any a with 3 a within 16 bits
+//   scaledHalf(a)           half of a scaled, rounded down: floor(3 a / 8), for any a with 3 a within 16 bits
 //   saturated(values)       eight 32-bit values, saturated to 16 bits
 //
 // A permutation gathers vectors from slices. Their lanes form groups of `group`, each of which takes all its values
@@ -21,6 +21,7 @@
 #include <utility>
 
 #include "Words.h"
+#include "rules/Algorithms.h"
 
 #if defined(__SSE2__)
 #include <immintrin.h>
@@ -91,7 +92,7 @@ struct Portable {
     template <unsigned count>
     static MORVIK_INLINE Eighths<count> scaledHalf(Eighths<count> a)
     {
-        return (a + a + a) >> 3;
+        return Eighths<count>{a.v * Eighths<count>::of(rules::scaleNumerator).v} >> (rules::scaleBits + 1);
     }
 
     /// Accepts any alignment.
@@ -110,10 +111,13 @@ struct Portable {
 // ---- SSE2, which `generic` has on x86-64
 
 #if defined(__SSE2__)
+/// Half of the scale of extrinsic values, times 2^16.
+constexpr std::int16_t halfOfScale = rules::scaleNumerator << (15 - rules::scaleBits);
+
 struct Sse2 : Portable {
     static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)
     {
-        return {(Raw<8>::Signed)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(3 << 13))};
+        return {(Raw<8>::Signed)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(halfOfScale))};
     }
 
     static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
@@ -212,7 +216,7 @@ struct Avx2 : Ssse3 {
     using Ssse3::scaledHalf;
     static MORVIK_INLINE Eighths<16> scaledHalf(Eighths<16> a)
     {
-        return {(Raw<16>::Signed)_mm256_mulhi_epi16((__m256i)a.v, _mm256_set1_epi16(3 << 13))};
+        return {(Raw<16>::Signed)_mm256_mulhi_epi16((__m256i)a.v, _mm256_set1_epi16(halfOfScale))};
     }
 };
 #endif
@@ -292,7 +296,7 @@ struct Avx512 : Avx2 {
     using Avx2::scaledHalf;
     static MORVIK_INLINE Eighths<32> scaledHalf(Eighths<32> a)
     {
-        return {(Raw<32>::Signed)_mm512_mulhi_epi16((__m512i)a.v, _mm512_set1_epi16(3 << 13))};
+        return {(Raw<32>::Signed)_mm512_mulhi_epi16((__m512i)a.v, _mm512_set1_epi16(halfOfScale))};
     }
 };
 #endif

@@ -13,7 +13,7 @@
 
 namespace morvik::lanes::MORVIK_LANES {
 
-/// Whether extrinsic values are passed on unscaled, or times 0.75.
+/// Whether extrinsic values are passed on unscaled, or times the scale of rules/Algorithms.h (rule 14).
 enum class Extrinsic { whole, scaled };
 
 /// Whether a pass keeps its ratios, as the last one does.

@@ -1,4 +1,4 @@
-// Algorithms: the names of the core's algorithms.
+// Algorithms: the core's algorithm types: their names, and the factor of their extrinsic values.
 #ifndef MORVIK_RULES_ALGORITHMS_H
 #define MORVIK_RULES_ALGORITHMS_H
 
@@ -21,6 +21,16 @@ constexpr std::optional<unsigned> findAlgorithm(std::string_view name)
         }
     }
     return std::nullopt;
+}
+
+/// The factor of type 1's extrinsic values, 0.75: scaleNumerator / 2^scaleBits (rule 14 of docs/arithmetic.md).
+constexpr int scaleNumerator = 3;
+constexpr int scaleBits = 2;
+
+/// The factor of the extrinsic values of an algorithm type (rule 14).
+constexpr double extrinsicScale(int algorithmType)
+{
+    return algorithmType == 1 ? static_cast<double>(scaleNumerator) / (1 << scaleBits) : 1.0;
 }
 
 }  // namespace morvik::rules

@@ -39,9 +39,9 @@ constexpr Value intrinsicValue(std::int32_t apriori, std::int32_t systematic, st
     return wrap16(twiceIntrinsicValue(apriori, systematic, stateMask) / 2);
 }
 
-/// The extrinsic part of a ratio, scaled, truncated toward zero and clipped (rule 14). The hardware's scales, 1 and
-/// 0.75, are exact, since the difference has 19 bits. The product is clipped before its conversion, which therefore
-/// cannot overflow; NaN becomes the lower limit.
+/// The extrinsic part of a ratio, scaled, truncated toward zero and clipped (rule 14). The hardware's scales
+/// (Algorithms.h) are exact, since the difference has 19 bits. The product is clipped before its conversion, which
+/// therefore cannot overflow; NaN becomes the lower limit.
 inline Value extrinsicValue(Value ratio, Value intrinsic, double scale, std::int32_t lo, std::int32_t hi)
 {
     const double product = (ratio - 4 * intrinsic) * scale;

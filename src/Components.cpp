@@ -3,6 +3,8 @@
 
 #include <string>
 
+#include "rules/Algorithms.h"
+
 namespace morvik::components {
 
 namespace {
@@ -57,7 +59,7 @@ const char* create(State& state)
     }
     state.decoder->itsInterleaver = state.interleaver;
     state.decoder->itsEngine = state.engine;
-    state.decoder->itsExtrinsicScale = generics.C_ALGORITHM_TYPE == 1 ? 0.75 : 1.0;
+    state.decoder->itsExtrinsicScale = rules::extrinsicScale(generics.C_ALGORITHM_TYPE);
     return nullptr;
 }
 

@@ -7,6 +7,8 @@
 #include <stdexcept>
 #include <string>
 
+#include "rules/Algorithms.h"
+
 namespace morvik::validation {
 
 namespace {
@@ -43,7 +45,7 @@ VariantDecoder::VariantDecoder(const Variant& variant, int algorithm)
     }
     itsDecoder->itsInterleaver = itsInterleaver.get();
     itsDecoder->itsEngine = itsEngine.get();
-    itsDecoder->itsExtrinsicScale = algorithm == 1 ? 0.75 : 1.0;
+    itsDecoder->itsExtrinsicScale = rules::extrinsicScale(algorithm);
 }
 
 const std::vector<unsigned char>& VariantDecoder::decode(const std::vector<double>& received,

@@ -5,6 +5,7 @@
 #include <memory>
 
 #include "Decisions.h"
+#include "rules/Algorithms.h"
 #include "rules/Formats.h"
 #include "rules/SoftValues.h"
 #include "rules/Starts.h"
@@ -505,7 +506,9 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
 int Replay::wideExtrinsicValue(int ratio, int twice, Mistake mistake) const
 {
     const int value = ratio - 2 * twice;
-    return itsModel.generics.C_ALGORITHM_TYPE == 1 && mistake != Mistake::unscaled ? 3 * value / 4 : value;
+    const bool isScaled =
+        rules::extrinsicScale(itsModel.generics.C_ALGORITHM_TYPE) != 1 && mistake != Mistake::unscaled;
+    return isScaled ? rules::scaleNumerator * value / (1 << rules::scaleBits) : value;
 }
 
 int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const

@@ -16,6 +16,7 @@
 #include "TNumberFormat.h"
 #include "lanes/InstructionSets.h"
 #include "lanes/LaneDecoder.h"
+#include "rules/Algorithms.h"
 #include "support/Blocks.h"
 #include "support/Environment.h"
 
@@ -47,7 +48,7 @@ struct Components {
         engine->initialise();
         decoder->itsInterleaver = interleaver.get();
         decoder->itsEngine = engine.get();
-        decoder->itsExtrinsicScale = algorithm == Algorithm::greatestScaled ? 0.75 : 1.0;
+        decoder->itsExtrinsicScale = morvik::rules::extrinsicScale(static_cast<int>(algorithm));
     }
 };
 

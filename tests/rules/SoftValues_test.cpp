@@ -1,10 +1,12 @@
-// SoftValues, Formats, Correction and Starts: the rules at the edges of their ranges.
+// SoftValues, Algorithms, Formats, Correction and Starts: the rules at the edges of their ranges.
 #include "rules/SoftValues.h"
 
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <limits>
 
+#include "rules/Algorithms.h"
 #include "rules/Correction.h"
 #include "rules/Formats.h"
 #include "rules/Starts.h"
@@ -76,6 +78,14 @@ TEST(SoftValues, ExtrinsicValuesAreScaledTruncatedAndClipped)
     EXPECT_EQ(extrinsic(1, 0, std::numeric_limits<double>::quiet_NaN()), -2048);
     EXPECT_EQ(extrinsicMask(1, -16), -1);
     EXPECT_EQ(extrinsicMask(0.75, -16), -16);
+}
+
+TEST(Algorithms, ScaleTheExtrinsicValuesOfTypeOne)
+{
+    EXPECT_EQ(extrinsicScale(0), 1);
+    EXPECT_EQ(extrinsicScale(1), 0.75);
+    EXPECT_EQ(extrinsicScale(2), 1);
+    EXPECT_EQ(extrinsicScale(1), std::ldexp(scaleNumerator, -scaleBits));
 }
 
 TEST(SoftValues, RatiosOfZeroOrMoreDecideForOne)
