@@ -161,6 +161,8 @@ EQUIVALENT = {
           ("== 8;  //", "!= 8;  //")]),
         ("an index has four bits",
          [("entries[lane % 16];", "entries[lane % 17];")]),
+        ("a value more, of the tail, which is dropped", [("copies[8]", "copies[9]")]),
+        ("a byte more, which the next lane writes again", [("2 * lane % 16, 2)", "2 * lane % 16, 3)")]),
     ],
     "link/coding/RateMatching.cpp": [
         ("arrays with an element more", [("mostPositions = 6176", "mostPositions = 6177")]),
