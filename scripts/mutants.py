@@ -251,6 +251,13 @@ EQUIVALENT = {
          [("g[1].store(slot", "g[2].store(slot")]),
         ("state 0 is 0 in border columns; a column more, into spare room",
          [("0; state", "1; state"), ("< states;", "<= states;")]),
+        ("windows of one length may run side by side or not: the speed alone",
+         [("r + 1 < w.windows &&", "r + 2 < w.windows &&"), ("r + 1 < w.windows &&", "r + 0 < w.windows &&"),
+          ("r + 1 < w.windows &&", "r + 1 <= w.windows &&"), ("lengthOf(r + 1)", "lengthOf(r + 2)"),
+          ("abreast == 1", "abreast == 0")]),
+        ("a column more, into room that is written later",
+         [("for (unsigned v = 0; v < vectors; ++v) {", "for (unsigned v = 0; v <= vectors; ++v) {")]),
+        ("metrics stay in bounds around any state", [("stored(m[0])", "stored(m[1])")]),
     ],
     "lanes/Transpose.h": [
         ("the last eight steps either way",
@@ -261,10 +268,15 @@ EQUIVALENT = {
          [(">> 15) +", ">> 14) +")]),
         ("rounded down to the number of halves",
          [("8; ++half)", "7; ++half)")]),
+        ("a row more, which is written again, or spare room",
+         [("for (unsigned i = 0; i < BestTile::size; ++i) {", "for (unsigned i = 0; i <= BestTile::size; ++i) {")]),
     ],
     "lanes/Words.h": [
         ("of equal values",
          [("{a.v > b.v", "{a.v >= b.v"), ("{a.v < b.v", "{a.v <= b.v")]),
+    ],
+    "lanes/Rules.h": [
+        ("the correction is 0 from index 6 on", [("of(4 * 15)", "of(3 * 15)"), ("of(4 * 15)", "of(4 * 14)")]),
     ],
 }
 
