@@ -116,7 +116,8 @@ stage_memory() {
 # each fault, and scripts that check numbers.
 stage_memory-short() {
     local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance'
-    local long="BerRuns|MpiRuns|Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore"
+    many+='|FindsTheSoftBuffer|FindsScales|FindsMistakesBy'
+    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore"
     local scripts='example_sweep|core_from_document|default_core'
     memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"
 }
