@@ -112,13 +112,14 @@ public:
     {
     }
 
-    comparison::Dump& dumpOf(std::uint64_t block) override
+    comparison::Dump& dumpOf(std::uint64_t number) override
     {
+        if (number >= itsSet.cases.size()) {
+            throw base::Error("is not in " + itsSet.folder);
+        }
+        const auto block = static_cast<std::size_t>(number);
         if (const auto open = itsOpen.find(block); open != itsOpen.end()) {
             return *open->second;
-        }
-        if (block >= itsSet.cases.size()) {
-            throw base::Error("is not in " + itsSet.folder);
         }
         if (!itsBegun.insert(block).second) {
             throw base::Error("comes back after the next but one has begun");
@@ -148,7 +149,7 @@ public:
 private:
     void compareFirst()
     {
-        const std::uint64_t block = itsOrder.front();
+        const std::size_t block = itsOrder.front();
         itsOrder.pop_front();
         const std::shared_ptr<comparison::Dump> dump = itsOpen.at(block);
         itsOpen.erase(block);
@@ -167,9 +168,9 @@ private:
     std::string itsFile;
     const CompareOptions& itsOptions;
     const comparison::NameMap& itsMap;
-    std::map<std::uint64_t, std::shared_ptr<comparison::Dump>> itsOpen;
-    std::deque<std::uint64_t> itsOrder;  // of the open ones
-    std::set<std::uint64_t> itsBegun;
+    std::map<std::size_t, std::shared_ptr<comparison::Dump>> itsOpen;
+    std::deque<std::size_t> itsOrder;  // of the open ones
+    std::set<std::size_t> itsBegun;
     Tasks itsTasks;  // the last member: they use the others
 };
 
