@@ -12,15 +12,8 @@ namespace morvik::diagnosis {
 
 namespace {
 
-/// Log odds that a mistake needs: by itself (e^-12 is a chance in 160 000 for each of the 1728 combinations), and
-/// together with blocks that decode once it is undone.
-constexpr double enoughByItself = 12;
-constexpr double enoughWithDecoding = 6;
-/// Standard deviations by which signs must beat chance to be related to the bits.
-constexpr double related = 5;
-
-/// With even fewer, decoding proves nothing: soft values of 0 decode into ones. Where a block of 40 bits just decodes,
-/// its signs beat chance by some 6 standard deviations.
+/// Standard deviations by which signs must beat chance where blocks are decoded. With even fewer, decoding proves
+/// nothing: soft values of 0 decode into ones. Where a block of 40 bits just decodes, its signs beat chance by some 6.
 constexpr double meaningful = 3;
 constexpr std::size_t likelyAttempts = 8;
 constexpr std::uint32_t simulatedBlocks = 400;
@@ -35,13 +28,6 @@ std::vector<Case> undone(const std::vector<Case>& cases, const Mistakes& mistake
         right.push_back(undone(block, mistakes));
     }
     return right;
-}
-
-/// The log odds that one more wrong sign is chance, if `fraction` of the signs are wrong anyway.
-double weightOf(const Signs& fewest)
-{
-    const double fraction = std::clamp((fewest.wrong + 1) / (fewest.all + 2), 1e-4, 0.49);
-    return std::log((1 - fraction) / fraction);
 }
 
 /// Log odds of belonging to the bits, comparable across numbers of values: values left out count as chance.

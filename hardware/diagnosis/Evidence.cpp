@@ -129,6 +129,12 @@ double Signs::odds() const
     return odds(fraction());
 }
 
+double weightOf(const Signs& fewest)
+{
+    const double fraction = std::clamp((fewest.wrong + 1) / (fewest.all + 2), 1e-4, 0.49);
+    return std::log((1 - fraction) / fraction);
+}
+
 std::vector<Suspicion> suspicions(const std::vector<Case>& cases)
 {
     std::vector<Suspicion> found;

@@ -35,6 +35,16 @@ struct Signs {
     double odds() const;
 };
 
+/// Log odds that a mistake needs: by itself (e^-12 is a chance in 160 000 for each of some thousand combinations), and
+/// together with blocks that decode once it is undone.
+constexpr double enoughByItself = 12;
+constexpr double enoughWithDecoding = 6;
+/// Standard deviations by which signs must beat chance to be related to the bits.
+constexpr double related = 5;
+
+/// The log odds that one more wrong sign is chance, next to a suspicion that explains the most signs.
+double weightOf(const Signs& fewest);
+
 /// Mistakes, and the signs once they are undone.
 struct Suspicion {
     Mistakes mistakes;

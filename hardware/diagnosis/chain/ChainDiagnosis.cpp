@@ -13,15 +13,10 @@ namespace morvik::diagnosis {
 
 namespace {
 
-/// As in Diagnosis.cpp: log odds that a mistake needs, by itself and together with blocks that decode without it.
-constexpr double enoughByItself = 12;
-constexpr double enoughWithDecoding = 6;
 /// Doublings by which a scale is off that counts as a mistake: where errors tell what the values mean, and where only
 /// their amplitude does.
 constexpr double enoughDoublings = 1;
 constexpr double enoughByAmplitude = 3;
-/// Standard deviations by which signs must beat chance to be related to the bits.
-constexpr double related = 5;
 /// Wrong signs that ratios promise for each wrong one: about one in noise, more if strong values are wrong.
 constexpr double contradictory = 1.3;
 constexpr std::size_t likelyAttempts = 6;
@@ -154,7 +149,7 @@ private:
         std::vector<ChainSuspicion> all = evidence.suspicions();
         const auto fewest = std::min_element(
             all.begin(), all.end(), [](const auto& a, const auto& b) { return a.signs.wrong < b.signs.wrong; });
-        itsWeight = ChainEvidence::weightOf(fewest->signs);
+        itsWeight = weightOf(fewest->signs);
         ChainSuspicion asIs = all.front();
         const auto byCost = [this](const ChainSuspicion& a, const ChainSuspicion& b) {
             return cost(a, enoughByItself) < cost(b, enoughByItself);
@@ -178,7 +173,7 @@ private:
         }
         for (const ChainSuspicion& each : withBuffers) {
             if (each.mistakes.bufferSize.best != 0) {
-                itsWeight = std::max(itsWeight, ChainEvidence::weightOf(each.signs));
+                itsWeight = std::max(itsWeight, weightOf(each.signs));
                 all.push_back(each);
             }
         }

@@ -104,12 +104,6 @@ Signs ChainEvidence::signsOf(long long sum) const
     return {(itsAll - static_cast<double>(sum)) / 2, itsAll};
 }
 
-double ChainEvidence::weightOf(const Signs& fewest)
-{
-    const double fraction = std::clamp((fewest.wrong + 1) / (fewest.all + 2), 1e-4, 0.49);
-    return std::log((1 - fraction) / fraction);
-}
-
 /// The agreement of every transmission with every redundancy version.
 ChainEvidence::Tally ChainEvidence::tallied(const ChainMistakes& mistakes) const
 {

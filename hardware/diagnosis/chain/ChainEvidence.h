@@ -46,9 +46,6 @@ public:
     /// The suspicion with the soft buffer that fits best.
     ChainSuspicion withBuffer(const ChainSuspicion& suspicion) const;
 
-    /// The log odds that one more wrong sign is chance, next to a suspicion that explains the most signs.
-    static double weightOf(const Signs& fewest);
-
 private:
     using Row = std::vector<std::int8_t>;                                       // signs: 1, 0 or -1
     using Sums = std::vector<std::array<long long, link::redundancyVersions>>;  // of each transmission
