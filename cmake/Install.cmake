@@ -11,7 +11,8 @@ set_target_properties(morvik_classes PROPERTIES EXPORT_NAME classes)
 install(TARGETS ${library} morvik_classes EXPORT ${library}
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
-install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} PATTERN morvik_link.h EXCLUDE PATTERN morvik_checker.h EXCLUDE)
+install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} PATTERN morvik_link.h EXCLUDE
+    PATTERN morvik_checker.h EXCLUDE PATTERN morvik_units.h EXCLUDE)
 install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 
 # The class headers and those that they include. Their names are common, so they have a folder of their own.
@@ -62,7 +63,7 @@ set_target_properties(morvik_checker_c PROPERTIES EXPORT_NAME morvik_checker)
 install(TARGETS morvik_checker_c EXPORT morvik_checker
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT checker
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
-install(FILES include/morvik_checker.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT checker)
+install(FILES include/morvik_checker.h include/morvik_units.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT checker)
 
 # What finds a library: a CMake package and a pkg-config file. A consumer of the other word size gets a message rather
 # than a linker error.

@@ -1,6 +1,7 @@
 /* The public headers alone, as strict C99. */
 #include "morvik_checker.h"
 #include "morvik_link.h"
+#include "morvik_units.h"
 #include "morvik_v1_0_version.h"
 
 /* Fourteen words: three pointers and eleven integers, with the padding that the pointers ask for. */

@@ -37,7 +37,8 @@ def main():
         sys.exit(__doc__)
     for header in map(pathlib.Path, sys.argv[1:]):
         lines = example_of(header)
-        parameters = "void" if "_create" in lines else "veltra_ip_morvik_v1_0_state* state"
+        has_state = "_create" not in lines and "veltra_ip_morvik_v1_0_state" in header.read_text()
+        parameters = "veltra_ip_morvik_v1_0_state* state" if has_state else "void"
         program = BEFORE.format(name=header.name, parameters=parameters) + lines + AFTER
         subprocess.run(["cc", "-std=c99", "-Wall", "-Wextra", "-Werror", "-Wno-unused-variable", "-Wno-unused-but-set-variable",
                         f"-I{header.parent}", "-fsyntax-only", "-x", "c", "-"], input=program, text=True, check=True)
