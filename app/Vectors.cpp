@@ -11,6 +11,7 @@
 #include "DecoderOptions.h"
 #include "Lists.h"
 #include "Notice.h"
+#include "UnitVectors.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
 #include "base/Numbers.h"
@@ -35,6 +36,7 @@ struct Options {
     std::optional<int> milliEbn0;  ///< as given, like
     std::optional<int> milliEsn0;  ///< this one
     vectors::Settings settings;
+    UnitVectors units;
 };
 
 /// What the random blocks are, as options that each follow a blank.
@@ -182,6 +184,17 @@ int check(const std::string& path)
     return success;
 }
 
+int makeUnits(const CLI::App& command, const Options& options)
+{
+    UnitVectors units = options.units;
+    units.folder = options.output;
+    units.algorithm = options.decoder.generics.C_ALGORITHM_TYPE;
+    units.seed = options.settings.seed;
+    units.formats = options.settings.formats;
+    units.blockSizes = options.settings.blockSizes;
+    return makeUnitVectors(command, units);
+}
+
 /// Refuses other options beside --check: the set records how it was made.
 void expectNoOtherThanCheck(const CLI::App& command)
 {
@@ -199,10 +212,14 @@ int run(const CLI::App& command, const Options& options)
         expectNoOtherThanCheck(command);
         return check(options.checked);
     }
+    if (!options.units.units.empty()) {
+        return makeUnits(command, options);
+    }
     const bool hasBlocks = !options.settings.blockSizes.empty() || options.link.hasTransportBlocks();
     if (options.output.empty() || !hasBlocks) {
         throw base::Error(
-            "--out and --block-size, --transport-block-size or --mcs, or --check, are required; see 'morvik vectors "
+            "--out and --block-size, --transport-block-size, --mcs or --unit, or --check, are required; see 'morvik "
+            "vectors "
             "--help'");
     }
     return make(options);
@@ -289,6 +306,9 @@ changes, extreme tags. With transport blocks, random blocks are their code block
 of rate recovery after each transmission: punctured, repeated, combined, saturated, with filler
 bits. docs/vectors.md describes the layout.
 
+With --unit, the folder gets a table for each unit, with its inputs and expected outputs, and a file
+NAME.json that counts what the cases meet: clips, wraps, ties, corrections. docs/units.md tells more.
+
 Exit status: 0 written, or no difference, 1 a difference was found, 2 bad input or usage.
 
 Example: words for $readmemh, and a check of them
@@ -311,6 +331,7 @@ Command addVectors(CLI::App& app)
     addBlockOptions(*command, *options);
     addDecoderOptions(*command, options->decoder);
     addFileOptions(*command, options->settings);
+    addUnitOptions(*command, options->units);
     command->footer(explanation);
     const auto work = [options, command] {
         return run(*command, *options);

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <type_traits>
 
 #include "Units.h"
 #include "hardware/comparison/Decisions.h"
@@ -61,6 +62,7 @@ Word pendingOf(const rules::PendingMetric<Word>& metric)
 template <class Word, class WordOf, class Advance>
 Column advanced(int algorithm, const Column& from, WordOf word, Advance advance)
 {
+    using comparison::wordOf;
     return withRule<Word>(algorithm, [&](const auto& rule) {
         rules::Column<std::decay_t<decltype(rule)>> column{};
         for (std::size_t state = 0; state < column.size(); ++state) {
@@ -69,8 +71,8 @@ Column advanced(int algorithm, const Column& from, WordOf word, Advance advance)
         column = advance(rule, column);
         Column reached;
         for (std::size_t state = 0; state < column.size(); ++state) {
-            reached.metrics[state] = eighthsOf(comparison::wordOf(rule.stored(column[state])));
-            reached.pending[state] = eighthsOf(comparison::wordOf(pendingOf(column[state])));
+            reached.metrics[state] = eighthsOf(wordOf(rule.stored(column[state])));
+            reached.pending[state] = eighthsOf(wordOf(pendingOf(column[state])));
         }
         return reached;
     });

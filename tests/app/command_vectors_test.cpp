@@ -1,4 +1,5 @@
 // The command morvik vectors: its options, what it prints, and its exit status.
+#include <algorithm>
 #include <nlohmann/json.hpp>
 #include <sstream>
 #include <string>
@@ -161,11 +162,60 @@ TEST_F(Vectors, TellsADifference)
     EXPECT_EQ(checked.out.rfind(told, 0), 0U) << checked.out;
 }
 
+TEST_F(Vectors, MakesCasesForUnits)
+{
+    const CommandResult made = vectors(
+        {"--unit", "forward,border", "--out", "u", "--algorithm", "table", "--cases", "5", "--format", "memh,csv"});
+    EXPECT_EQ(made.status, 0) << made.err;
+    EXPECT_EQ(
+        made.out.rfind("u: for the algorithm table\nforward: 5189 cases in csv,memh: 5184 directed, 5 random\n", 0), 0U)
+        << made.out;
+    EXPECT_NE(made.out.find("\nborder: 4096 cases in csv,memh, exhaustive\n"), std::string::npos) << made.out;
+    const auto description = nlohmann::json::parse(morvik.read("u/forward.json"));
+    EXPECT_EQ(description["cases"], 5189);
+    EXPECT_EQ(description["exhaustive"], false);
+    EXPECT_EQ(description["columns"].size(), 8 + 8 + 4 + 8 + 8U);
+    EXPECT_EQ(description["files"].size(), 2U);
+    const std::string rows = morvik.read("u/forward.csv");
+    EXPECT_EQ(std::count(rows.begin(), rows.end(), '\n'), 5190);
+    const CommandResult again =
+        vectors({"--unit", "forward", "--out", "again", "--algorithm", "table", "--cases", "5"});
+    EXPECT_EQ(again.status, 0) << again.err;
+    EXPECT_EQ(morvik.read("again/forward.memh"), morvik.read("u/forward.memh"));
+}
+
+TEST_F(Vectors, MakesCasesForUnitsWithoutPendingCorrections)
+{
+    vectors({"--unit", "address,backward", "--out", "u", "--block-size", "48", "--cases", "0", "--format", "csv"});
+    const std::string rows = morvik.read("u/backward.csv");
+    EXPECT_EQ(rows.substr(0, rows.find('\n')),
+              "block,beta0,beta1,beta2,beta3,beta4,beta5,beta6,beta7,g0,g1,g2,g3,"
+              "previous0,previous1,previous2,previous3,previous4,previous5,previous6,previous7");
+    const std::string addresses = morvik.read("u/address.csv");
+    EXPECT_EQ(addresses.substr(0, 54), "block,block_size,step,address\n0,48,0,0\n0,48,1,19\n0,48,");
+}
+
+TEST_F(Vectors, RefusesWhatUnitsHaveNoUseFor)
+{
+    const std::string help = "; see 'morvik vectors --help'";
+    expectRefused({"--unit", "gamma", "--out", "u"},
+                  "--unit: \"gamma\" is not allowed, expected intrinsic, branch, forward, backward, ratio, extrinsic, "
+                  "address, tail or border" +
+                      help);
+    expectRefused({"--unit", "branch"}, "--unit requires --out");
+    expectRefused({"--unit", "branch", "--out", "u", "--num-pu", "4"},
+                  "--num-pu cannot be combined with --unit, as a unit does not depend on it");
+    expectRefused({"--unit", "branch", "--out", "u", "--block-size", "40"},
+                  "--block-size is for the unit address alone");
+    expectRefused({"--out", "u", "--block-size", "40", "--cases", "3"}, "--cases requires --unit" + help);
+}
+
 TEST_F(Vectors, RefusesWhatIsNotAllowed)
 {
     const std::string help = "; see 'morvik vectors --help'";
     const std::string required =
-        "--out and --block-size, --transport-block-size or --mcs, or --check, are required; see 'morvik vectors "
+        "--out and --block-size, --transport-block-size, --mcs or --unit, or --check, are required; see 'morvik "
+        "vectors "
         "--help'";
     expectRefused({}, required);
     expectRefused({"--out", "set"}, required);

@@ -28,7 +28,7 @@ BELOW = {
     "hardware/vectors": "base hardware/tables hardware/testbench link link/channel link/coding rules simulation",
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
-    "hardware/units": "base hardware/comparison hardware/tables hardware/testbench rules",
+    "hardware/units": "hardware/comparison hardware/tables hardware/testbench rules",
     "hardware/checker": "base hardware/comparison hardware/testbench rules",
     "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
     "hardware/diagnosis/chain": "base hardware/diagnosis hardware/testbench link link/coding link/modulation rules simulation",

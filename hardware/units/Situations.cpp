@@ -1,0 +1,300 @@
+// Situations: counts what cases meet in the arithmetic of a unit: clips, wraps, ties, corrections.
+#include "Situations.h"
+
+#include <algorithm>
+#include <numeric>
+#include <utility>
+
+#include "Units.h"
+#include "Watched.h"
+#include "rules/Algorithms.h"
+
+namespace morvik::units {
+
+namespace {
+
+constexpr unsigned states = rules::stateCount;
+constexpr unsigned decisionsOfBit = states - 1;  // of the ratio's tree
+constexpr unsigned pairsOfBit = states / 2;      // the first of them, on which nothing is pending yet
+
+/// The corrections of the table in eighths, the greatest first (rule 9).
+constexpr std::array<int, 6> entries = {6, 4, 3, 2, 1, 0};
+
+std::vector<Situation> ofDecisions(const char* place, unsigned places, bool isRatio, int algorithm)
+{
+    const std::vector<std::uint64_t> counts(places);
+    std::vector<Situation> all = {{"first candidate greater", place, counts},
+                                  {"second candidate greater", place, counts},
+                                  {"tie", place, counts},
+                                  {"comparison wraps", place, counts}};
+    if (algorithm == tableAlgorithm) {
+        for (const int entry : entries) {
+            all.push_back({"correction " + std::to_string(entry) + ", first candidate", place, counts});
+            all.push_back({"correction " + std::to_string(entry) + ", second candidate", place, counts});
+        }
+        const unsigned withoutPending = isRatio ? 2 * pairsOfBit : 0;
+        all.push_back({"pending correction added", place, std::vector<std::uint64_t>(places - withoutPending)});
+    }
+    all.push_back({"a sum wraps", "", {0}});
+    if (isRatio) {
+        all.push_back({"the ratio wraps", "", {0}});
+    }
+    return all;
+}
+
+std::vector<Situation> ofExtrinsicValues(int algorithm)
+{
+    std::vector<Situation> all = {{"clipped to 127", "", {0}}, {"clipped to -128", "", {0}}};
+    if (rules::extrinsicScale(algorithm) != 1) {
+        all.push_back({"rounded down, positive", "", {0}});
+        all.push_back({"rounded down, negative", "", {0}});
+    }
+    return all;
+}
+
+std::vector<Situation> situationsOf(Number unit, int algorithm)
+{
+    switch (unit) {
+    case Number::intrinsic:
+        return {{"a-priori value odd, positive", "", {0}},
+                {"a-priori value odd, negative", "", {0}},
+                {"sum odd", "", {0}},
+                {"sum above 127", "", {0}},
+                {"sum below -128", "", {0}}};
+    case Number::branch:
+        return {{"clipped to 127", "metric", {0, 0}},
+                {"clipped to -128", "metric", {0, 0}},
+                {"127 without clipping", "metric", {0, 0}},
+                {"-128 without clipping", "metric", {0, 0}}};
+    case Number::forward:
+    case Number::backward:
+        return ofDecisions("state", states, false, algorithm);
+    case Number::ratio:
+        return ofDecisions("decision", 2 * decisionsOfBit, true, algorithm);
+    case Number::extrinsic:
+        return ofExtrinsicValues(algorithm);
+    case Number::address:
+        return {{"first address", "", {0}}, {"address above the one before", "", {0}}, {"address modulo K", "", {0}}};
+    case Number::tail:
+        return {{"branch sum beyond eight bits", "step", {0, 0, 0}},
+                {"low bits cleared", "state", std::vector<std::uint64_t>(states)}};
+    case Number::border:
+        break;
+    }
+    return {{"low bits cleared", "state", std::vector<std::uint64_t>(states)},
+            {"no low bits to clear", "state", std::vector<std::uint64_t>(states)}};
+}
+
+/// Hands out the situations of a case in their order.
+class Counter {
+public:
+    Counter(std::vector<Situation>& all, unsigned place) : itsNext(all.begin()), itsPlace(place) {}
+
+    Counter& at(unsigned place)
+    {
+        itsPlace = place;
+        return *this;
+    }
+
+    Counter& next(bool isMet)
+    {
+        itsNext->counts[itsPlace] += isMet ? 1U : 0U;
+        ++itsNext;
+        return *this;
+    }
+
+private:
+    std::vector<Situation>::iterator itsNext;
+    unsigned itsPlace;
+};
+
+void countDecisions(const Watch& watch, bool isRatio, int algorithm, std::vector<Situation>& all)
+{
+    unsigned withPending = 0;
+    for (unsigned place = 0; place < watch.decisions.size(); ++place) {
+        const Decision& met = watch.decisions[place];
+        Counter counter(all, place);
+        counter.next(met.difference > 0).next(met.difference < 0).next(met.difference == 0).next(met.wraps);
+        if (algorithm == tableAlgorithm) {
+            const int correction = eighthsOf(corrections()[met.difference]);
+            for (const int entry : entries) {
+                counter.next(entry == correction && met.difference >= 0);
+                counter.next(entry == correction && met.difference < 0);
+            }
+            if (!isRatio || place % decisionsOfBit >= pairsOfBit) {
+                counter.at(withPending++).next(met.addsPending);
+            }
+        }
+    }
+}
+
+template <class Row>
+auto rowAt(const std::vector<std::int32_t>& inputs, std::size_t first)
+{
+    Row row{};
+    std::copy_n(inputs.begin() + static_cast<std::ptrdiff_t>(first), row.size(), row.begin());
+    return row;
+}
+
+void countStep(bool isForward, int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    Watch watch;
+    const Column from = {rowAt<Metrics>(inputs, 0), rowAt<Metrics>(inputs, states)};
+    const auto word = [&](std::int32_t eighths) {
+        return Watched{aligned(eighths), &watch};
+    };
+    const auto branchWord = [&](std::int32_t eighths) {
+        return Watched{aligned(eighths), &watch, true};
+    };
+    const auto g = wordsOf<Watched>(rowAt<Branches>(inputs, std::size_t{2} * states), branchWord);
+    advanced<Watched>(algorithm, from, word, [&](const auto& rule, const auto& column) {
+        return isForward ? rules::forwardStep(rule, column, g) : rules::backwardStep(rule, column, g);
+    });
+    countDecisions(watch, false, algorithm, all);
+    all.back().counts[0] += watch.sumWraps ? 1U : 0U;
+}
+
+void countRatio(int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    Watch watch;
+    const auto word = [&](std::int32_t eighths) {
+        return Watched{aligned(eighths), &watch};
+    };
+    const auto branchWord = [&](std::int32_t eighths) {
+        return Watched{aligned(eighths), &watch, true};
+    };
+    const auto alpha = wordsOf<Watched>(rowAt<Metrics>(inputs, 0), word);
+    const auto beta = wordsOf<Watched>(rowAt<Metrics>(inputs, states), word);
+    const auto g = wordsOf<Watched>(rowAt<Branches>(inputs, std::size_t{2} * states), branchWord);
+    const std::int32_t difference = withRule<Watched>(algorithm, [&](const auto& rule) {
+        const std::int32_t one = rules::bestPath<1>(rule, alpha, beta, g).value;
+        return one - rules::bestPath<0>(rule, alpha, beta, g).value;
+    });
+    countDecisions(watch, true, algorithm, all);
+    all[all.size() - 2].counts[0] += watch.sumWraps ? 1U : 0U;
+    all.back().counts[0] += rules::wrap16(difference) != difference ? 1U : 0U;
+}
+
+void countBranches(const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    const auto& range = rangeOf(Kind::branch);
+    const auto sums = rules::branchSums<std::int32_t>(inputs[0], inputs[1], 0);
+    for (unsigned metric = 0; metric < all.front().counts.size(); ++metric) {
+        const std::int32_t sum = sums[metric];
+        Counter(all, metric)
+            .next(sum > range.highest)
+            .next(sum < range.lowest)
+            .next(sum == range.highest)
+            .next(sum == range.lowest);
+    }
+}
+
+void countExtrinsic(int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    const auto& range = rangeOf(Kind::apriori);
+    const double scaled = (inputs[0] - 2 * inputs[1]) * rules::extrinsicScale(algorithm);
+    const bool isClipped = scaled > range.highest || scaled < range.lowest;
+    Counter counter(all, 0);
+    counter.next(scaled > range.highest).next(scaled < range.lowest);
+    if (rules::extrinsicScale(algorithm) != 1) {
+        const bool isRounded = !isClipped && scaled != extrinsic(algorithm, inputs[0], inputs[1]);
+        counter.next(isRounded && scaled > 0).next(isRounded && scaled < 0);
+    }
+}
+
+/// Counts the metrics that are not `kept` as they were.
+void countCleared(const Metrics& whole, const Metrics& kept, Situation& situation)
+{
+    for (unsigned state = 0; state < states; ++state) {
+        situation.counts[state] += whole[state] != kept[state] ? 1U : 0U;
+    }
+}
+
+void countTail(const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    const auto x = rowAt<TailValues>(inputs, 0);
+    const auto p = rowAt<TailValues>(inputs, x.size());
+    const auto& range = rangeOf(Kind::branch);
+    for (std::size_t step = 0; step < x.size(); ++step) {
+        const auto sums = rules::branchSums<std::int32_t>(x[step], p[step], 0);
+        const auto [least, most] = std::minmax_element(sums.begin(), sums.end());
+        all[0].counts[step] += *least < range.lowest || *most > range.highest ? 1U : 0U;
+    }
+    const auto whole = rules::tailColumn<std::int32_t>({{x[0], x[1], x[2]}, {p[0], p[1], p[2]}, {}});
+    countCleared(whole, tail(x, p), all[1]);
+}
+
+void countBorder(const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    const auto column = rowAt<Metrics>(inputs, 0);
+    countCleared(column, border(column), all[0]);
+    for (unsigned state = 0; state < states; ++state) {
+        all[1].counts[state] += border(column)[state] == column[state] ? 1U : 0U;
+    }
+}
+
+void countIntrinsic(const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
+{
+    const std::int32_t apriori = inputs[0];
+    const std::int32_t sum = twiceIntrinsic(apriori, inputs[1]);
+    const auto& range = rangeOf(Kind::branch);
+    const bool isOdd = apriori % 2 != 0;
+    Counter(all, 0)
+        .next(isOdd && apriori > 0)
+        .next(isOdd && apriori < 0)
+        .next(sum % 2 != 0)
+        .next(sum > range.highest)
+        .next(sum < range.lowest);
+}
+
+}  // namespace
+
+std::uint64_t Situation::total() const
+{
+    return std::accumulate(counts.begin(), counts.end(), std::uint64_t{0});
+}
+
+std::uint64_t Situation::fewest() const
+{
+    return *std::min_element(counts.begin(), counts.end());
+}
+
+Situations::Situations(Number unit, int algorithm)
+    : itsUnit(unit), itsAlgorithm(algorithm), itsAll(situationsOf(unit, algorithm))
+{
+}
+
+void Situations::countAddress(const std::vector<std::int32_t>& inputs, std::int32_t address)
+{
+    const bool isFirst = inputs[1] == 0;
+    Counter(itsAll, 0)
+        .next(isFirst)
+        .next(!isFirst && address > itsLastAddress)
+        .next(!isFirst && address < itsLastAddress);
+    itsLastAddress = address;
+}
+
+void Situations::add(const std::vector<std::int32_t>& inputs, const std::vector<std::int32_t>& outputs)
+{
+    switch (itsUnit) {
+    case Number::intrinsic:
+        return countIntrinsic(inputs, itsAll);
+    case Number::branch:
+        return countBranches(inputs, itsAll);
+    case Number::forward:
+    case Number::backward:
+        return countStep(itsUnit == Number::forward, itsAlgorithm, inputs, itsAll);
+    case Number::ratio:
+        return countRatio(itsAlgorithm, inputs, itsAll);
+    case Number::extrinsic:
+        return countExtrinsic(itsAlgorithm, inputs, itsAll);
+    case Number::address:
+        return countAddress(inputs, outputs[0]);
+    case Number::tail:
+        return countTail(inputs, itsAll);
+    case Number::border:
+        return countBorder(inputs, itsAll);
+    }
+}
+
+}  // namespace morvik::units
