@@ -7,6 +7,7 @@
 #include <exception>
 
 #include "bindings/simulator/Session.h"
+#include "bindings/simulator/UnitCall.h"
 #include "morvik_checker.h"
 
 namespace {
@@ -16,6 +17,13 @@ using morvik::simulator::Session;
 Session* sessionOf(void* decoder)
 {
     return static_cast<Session*>(decoder);
+}
+
+/// Calls of units by this thread.
+morvik::simulator::UnitCall& unitCall()
+{
+    thread_local morvik::simulator::UnitCall call;
+    return call;
 }
 
 /// Only memory can fail in a session.
@@ -99,4 +107,24 @@ int morvik_dpi_observe_row(void* checker,
     const std::array<std::int32_t, 8> values = {value0, value1, value2, value3, value4, value5, value6, value7};
     return morvik_checker_observe_row(
         static_cast<morvik_checker*>(checker), signal, half_iteration, step, values.data());
+}
+
+void morvik_dpi_unit_put(int value)
+{
+    unitCall().put(value);
+}
+
+int morvik_dpi_unit_compute(int unit, int algorithm)
+{
+    return unitCall().compute(unit, algorithm);
+}
+
+int morvik_dpi_unit_result(int number)
+{
+    return unitCall().result(number);
+}
+
+const char* morvik_dpi_unit_message(void)
+{
+    return unitCall().message().c_str();
 }

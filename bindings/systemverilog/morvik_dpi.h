@@ -49,6 +49,20 @@ MORVIK_API int morvik_dpi_observe_row(void* checker,
                                       int value6,
                                       int value7);
 
+/* The units of the core: inputs one after the other, then the number of the unit, then its results. */
+
+/* Appends an input of the next call. */
+MORVIK_API void morvik_dpi_unit_put(int value);
+
+/* Computes, and forgets the inputs. Returns the number of results, 0 if something was refused. */
+MORVIK_API int morvik_dpi_unit_compute(int unit, int algorithm);
+
+/* A result of the last call. */
+MORVIK_API int morvik_dpi_unit_result(int number);
+
+/* Why the last call was refused, a line that begins with "ERROR:", or "". */
+MORVIK_API const char* morvik_dpi_unit_message(void);
+
 #ifdef __cplusplus
 }
 #endif

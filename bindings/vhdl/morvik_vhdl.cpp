@@ -12,6 +12,7 @@
 #include <string>
 
 #include "bindings/simulator/Session.h"
+#include "bindings/simulator/UnitCall.h"
 #include "morvik_checker.h"
 
 namespace {
@@ -52,6 +53,13 @@ morvik_checker* findChecker(std::int32_t checker)
 {
     const auto found = checkers().find(checker);
     return found == checkers().end() ? nullptr : found->second.get();
+}
+
+/// Calls of units.
+morvik::simulator::UnitCall& unitCall()
+{
+    static morvik::simulator::UnitCall call;
+    return call;
 }
 
 /// The last message taken.
@@ -239,6 +247,30 @@ MORVIK_API std::int32_t morvik_vhdl_checker_report(std::int32_t checker)
 MORVIK_API std::int32_t morvik_vhdl_checker_message(std::int32_t checker)
 {
     return take(morvik_checker_message(findChecker(checker)));
+}
+
+/// Appends an input of the next unit.
+MORVIK_API void morvik_vhdl_unit_put(std::int32_t value)
+{
+    unitCall().put(value);
+}
+
+/// Computes what a unit makes of the inputs, and forgets those. Returns the number of results, 0 if something was
+/// refused.
+MORVIK_API std::int32_t morvik_vhdl_unit_compute(std::int32_t unit, std::int32_t algorithm)
+{
+    return unitCall().compute(unit, algorithm);
+}
+
+MORVIK_API std::int32_t morvik_vhdl_unit_result(std::int32_t number)
+{
+    return unitCall().result(number);
+}
+
+/// Takes why the last call was refused, as morvik_vhdl_message does.
+MORVIK_API std::int32_t morvik_vhdl_unit_message()
+{
+    return take(unitCall().message().c_str());
 }
 
 }  // extern "C"

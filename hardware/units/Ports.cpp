@@ -68,6 +68,9 @@ void expectBlockSize(std::int32_t size, std::int32_t step)
 
 void expectWithin(const Port& port, unsigned index, std::int32_t value, int algorithm)
 {
+    if (value == unknownValue) {
+        throw BadInput(nameOf(port, index) + " has bits that are x or z");
+    }
     const Range& range = rangeOf(port.kind);
     const bool hasTable = port.kind != Kind::pending || algorithm == tableAlgorithm;
     const std::int32_t highest = hasTable ? range.highest : 0;

@@ -81,6 +81,9 @@ public:
 /// Throws BadInput for an algorithm type other than 0 to 2.
 void expectAlgorithm(int algorithm);
 
+/// An input with bits that are x or z, which a register cannot tell.
+constexpr std::int32_t unknownValue = INT32_MIN;
+
 /// The values of the unit's outputs, port after port. Throws BadInput unless there is one value for each input, within
 /// its range.
 std::vector<std::int32_t> compute(Number unit, int algorithm, const std::vector<std::int32_t>& inputs);

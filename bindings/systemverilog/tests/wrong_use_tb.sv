@@ -143,6 +143,76 @@ module wrong_use_tb;
         check.destroy();
     endfunction
 
+    function automatic void expect_row(bit ok, metrics_t got, string expected);
+        string text;
+        text = $sformatf("%0d %0d %0d %0d %0d %0d %0d %0d", got[0], got[1], got[2], got[3], got[4], got[5], got[6], got[7]);
+        if (ok && text == expected)
+            return;
+        failures++;
+        $display("expected %s, got %s", expected, text);
+    endfunction
+
+    // Each unit with the values that the tests of all bindings have.
+    function automatic void use_units();
+        morvik_units units;
+        metrics_t alpha, beta, pending, systematic, parity, g, result, result_pending;
+        bit ok;
+        for (int i = 0; i < 8; i++) begin
+            alpha[i] = 12 * i - 40;
+            beta[i] = 20 - 9 * i;
+            pending[i] = i < 5 ? i : 6;
+            g[i] = 0;
+            result_pending[i] = 0;
+        end
+        systematic = '{1, -20, 30, 0, 0, 0, 0, 0};
+        parity = '{-100, 50, -6, 0, 0, 0, 0, 0};
+        units = new(ALGORITHM_TABLE);
+        ok = units.branch(units.intrinsic(10, -24), 16, g);
+        expect_row(ok, '{g[0], g[1], g[2], g[3], 0, 0, 0, 0}, "-3 -35 -35 -3 0 0 0 0");
+        ok = units.forward(alpha, pending, g, result, result_pending);
+        expect_row(ok, result, "-30 34 47 53 -24 21 61 47");
+        expect_row(ok, result_pending, "4 0 0 1 1 0 0 4");
+        ok = units.backward(beta, pending, g, result, result_pending);
+        expect_row(ok, result, "23 17 16 47 39 7 -7 -1");
+        ok = units.tail(systematic, parity, result);
+        expect_row(ok, result, "40 -160 104 -96 -152 48 -8 192");
+        ok = units.border(alpha, result);
+        expect_row(ok, result, "-40 -32 -16 -8 8 16 32 40");
+        result = '{units.ratio(alpha, beta, g), units.extrinsic(-101, -19), units.address(40, 7), 0, 0, 0, 0, 0};
+        expect_row(1, result, "-33 -63 31 0 0 0 0 0");
+        units = new(ALGORITHM_SCALED);
+        if (units.extrinsic(-101, -19) != -48)
+            failures++;
+    endfunction
+
+    function automatic void refuse_units();
+        morvik_units units;
+        metrics_t zeros, column, pending, result, result_pending;
+        for (int i = 0; i < 8; i++)
+            zeros[i] = 0;
+        column = zeros;
+        pending = zeros;
+        result = zeros;
+        result_pending = zeros;
+        units = new(ALGORITHM_TABLE);
+        column[3] = 2048;
+        if (units.forward(column, zeros, zeros, result, result_pending)
+            || units.message != "ERROR:unit:alpha3 2048 is not allowed, expected -2048 to 2047")
+            failures++;
+        column[3] = VALUE_UNKNOWN;  // what x becomes; Verilator itself has none
+        if (units.ratio(column, zeros, zeros) != VALUE_UNKNOWN
+            || units.message != "ERROR:unit:alpha3 has bits that are x or z")
+            failures++;
+        if (units.address(40, 40) != VALUE_UNKNOWN || units.message != "ERROR:unit:step 40 is not allowed, expected 0 to 39")
+            failures++;
+        pending[7] = 3;
+        if (!units.backward(zeros, pending, zeros, result, result_pending) || result_pending[0] != 6)
+            failures++;
+        units = new;
+        if (units.backward(zeros, pending, zeros, result, result_pending))
+            failures++;
+    endfunction
+
     // The class unchanged.
     function automatic void report();
         morvik_decoder model;
@@ -175,6 +245,8 @@ module wrong_use_tb;
             refuse_generics();
             refuse_blocks();
             refuse_checks();
+            use_units();
+            refuse_units();
             warn();
             call_with_null();
         end
