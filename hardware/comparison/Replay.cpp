@@ -2,13 +2,15 @@
 #include "Replay.h"
 
 #include <cstddef>
+#include <memory>
 
 #include "Decisions.h"
-#include "hardware/testbench/Corrections.h"
 #include "rules/Algorithms.h"
 #include "rules/Formats.h"
 #include "rules/SoftValues.h"
 #include "rules/Starts.h"
+#include "src/TCalculationEngineModBase.h"
+#include "src/TNumberFormat.h"
 
 namespace morvik::comparison {
 
@@ -16,6 +18,12 @@ namespace {
 
 constexpr int eighth = 1 << rules::stateAlignment;  // in aligned words of the state format
 constexpr int eighthMask = -eighth;
+
+std::vector<unsigned char> correctionTable()
+{
+    const std::unique_ptr<TNumberFormat> format(TNumberFormat::create("Fix_12_3"));
+    return TCalculationEngineModBase::createLUT(16, *format);
+}
 
 /// The low bits of a value, sign-extended.
 int cutTo(int value, int bits)
@@ -64,20 +72,20 @@ unsigned shiftOf(Mistake mistake)
 
 /// Calls use(rule, value) with the decision rule and a value of its type.
 template <class Use>
-auto withRule(int algorithm, Mistake mistake, Use use)
+auto withRule(int algorithm, Mistake mistake, const unsigned char* middle, Use use)
 {
     using Word = std::int16_t;
-    const Corrections<Word> table{corrections(), shiftOf(mistake)};
+    const Corrections<Word> corrections{middle, shiftOf(mistake)};
     if (algorithm != 2 || mistake == Mistake::uncorrected) {
         return mistake == Mistake::unwrapped ? use(rules::DecideMax<Held>(), Held())
                                              : use(rules::DecideMax<Word>(), Word());
     }
     if (mistake == Mistake::correctedAtOnce) {
-        return use(rules::DecideMaxStar<Word, Corrections<Word>>(table), Word());
+        return use(rules::DecideMaxStar<Word, Corrections<Word>>(corrections), Word());
     }
     return mistake == Mistake::unwrapped
-               ? use(rules::DecideMaxHash<Held, Corrections<Held>>(Corrections<Held>{corrections()}), Held())
-               : use(rules::DecideMaxHash<Word, Corrections<Word>>(table), Word());
+               ? use(rules::DecideMaxHash<Held, Corrections<Held>>(Corrections<Held>{middle}), Held())
+               : use(rules::DecideMaxHash<Word, Corrections<Word>>(corrections), Word());
 }
 
 template <class Decision, class Value>
@@ -145,7 +153,10 @@ Column inEighths(const Words& words, bool complete)
 
 }  // namespace
 
-Replay::Replay(const Model& model, const Values& dump) : itsModel(model), itsDump(dump) {}
+Replay::Replay(const Model& model, const Values& dump)
+    : itsModel(model), itsDump(dump), itsCorrections(correctionTable())
+{
+}
 
 Column Replay::column(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake) const
 {
@@ -346,7 +357,7 @@ Replay::Metrics Replay::reached(
         }
         return words;
     };
-    return withRule(algorithm, mistake, advance);
+    return withRule(algorithm, mistake, itsCorrections.data() + itsCorrections.size() / 2, advance);
 }
 
 namespace {
@@ -486,7 +497,8 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
         }
         return wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
     };
-    const std::int16_t word = withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, ratio);
+    const std::int16_t word =
+        withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, itsCorrections.data() + itsCorrections.size() / 2, ratio);
     const auto unshifted = static_cast<std::int16_t>(word >> shift);
     return inEighths(registered(std::array<std::int16_t, 1>{unshifted}, mistake), complete);
 }

@@ -5,6 +5,7 @@
 #include <array>
 #include <cstdint>
 #include <optional>
+#include <vector>
 
 #include "Model.h"
 #include "Values.h"
@@ -132,6 +133,7 @@ private:
 
     const Model& itsModel;
     const Values& itsDump;
+    std::vector<unsigned char> itsCorrections;  // by decision difference, from -32768
 };
 
 }  // namespace morvik::comparison
