@@ -67,6 +67,22 @@ package morvik_pkg;
     typedef bit decisions_t[];
     typedef logic signed [31:0] metrics_t[8];  // a row; the last four of g are not used
 
+    // The row of a column of state metrics: eight registers of 12 bits side by side, that of state 0 in the lowest bits.
+    function automatic metrics_t metrics_of(logic [95:0] bits);
+        metrics_t row;
+        for (int state = 0; state < 8; state++)
+            row[state] = 32'($signed(bits[12 * state +: 12]));
+        return row;
+    endfunction
+
+    // The row of branch metrics: four registers of 8 bits side by side, g0 in the lowest bits.
+    function automatic metrics_t branches_of(logic [31:0] bits);
+        metrics_t row;
+        for (int i = 0; i < 8; i++)
+            row[i] = i < 4 ? 32'($signed(bits[8 * i +: 8])) : 0;
+        return row;
+    endfunction
+
     // How error and warning lines reach the log. A derived class can hand them to uvm_error and uvm_warning instead; an
     // object of it in morvik_log serves all decoders.
     class morvik_reporter;

@@ -215,11 +215,9 @@ private:
         return !isUnknown(field(of.pass), NumberForm::integer) && !isUnknown(field(of.step), NumberForm::integer);
     }
 
-    StepPlace namedPlace(const RowTiming& of) const
+    NamedPlace namedPlace(const RowTiming& of) const
     {
-        const Values& values = itsDump->values;
-        return {itsFile.count("half-iteration", field(of.pass), itsMap.firstPass, values.passes()),
-                itsFile.count("step", field(of.step), itsMap.firstStep, values.steps())};
+        return {itsFile.integer("half-iteration", field(of.pass)), itsFile.integer("step", field(of.step))};
     }
 
     /// Keeps the places for values that come late. A row is a clock.
@@ -246,13 +244,13 @@ private:
         if (of.valid && field(*of.valid) != "1") {
             return std::nullopt;
         }
-        std::optional<StepPlace> place;
+        std::optional<NamedPlace> named;
         if (itsMap.timings[element.timing].delay > 0) {
-            place = of.history.delayed();
+            named = of.history.delayed();
         } else if (!isUnknownValue || namesItsPlace(of)) {
-            place = namedPlace(of);
+            named = namedPlace(of);
         }
-        return place ? itsDump->placeOf(*place, element) : std::nullopt;
+        return named ? itsDump->placeOf(itsFile.placeOf(*named, itsMap, itsDump->values), element) : std::nullopt;
     }
 
     void take(std::string_view name, const Element& element, std::string_view text)

@@ -39,15 +39,29 @@ bool DumpFile::nextFilled()
     return false;
 }
 
-unsigned DumpFile::count(const std::string& what, std::string_view text, unsigned first, unsigned count) const
+std::int64_t DumpFile::integer(const std::string& what, std::string_view text) const
 {
-    const auto value = base::parseNumber<unsigned>(text);
-    if (!value || *value < first || *value - first >= count) {
-        fail(what + ' ' + base::shown(text) + " is not allowed, expected an integer from " + std::to_string(first) +
-             " to " + std::to_string(first + count - 1) +
-             (first == 0 && value == count ? "; use a map if they count from 1" : ""));
+    const auto value = base::parseNumber<std::int64_t>(text);
+    if (!value) {
+        fail(what + ' ' + base::shown(text) + " is not allowed, expected an integer");
     }
-    return *value - first;
+    return *value;
+}
+
+unsigned DumpFile::count(const std::string& what, std::int64_t number, unsigned first, unsigned count) const
+{
+    if (number < first || number - first >= count) {
+        fail(what + ' ' + base::shown(std::to_string(number)) + " is not allowed, expected an integer from " +
+             std::to_string(first) + " to " + std::to_string(first + count - 1) +
+             (first == 0 && number == count ? "; use a map if they count from 1" : ""));
+    }
+    return static_cast<unsigned>(number - first);
+}
+
+StepPlace DumpFile::placeOf(const NamedPlace& named, const NameMap& map, const Values& values) const
+{
+    return {count("half-iteration", named.pass, map.firstPass, values.passes()),
+            count("step", named.step, map.firstStep, values.steps())};
 }
 
 Dump& DumpFile::dumpOf(std::string_view number, const NameMap& map, DumpSink& sink) const

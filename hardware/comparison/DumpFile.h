@@ -28,8 +28,13 @@ public:
     /// Advances to the next line that is not blank; false at the end.
     bool nextFilled();
 
-    /// Parses a number that counts from `first`, and returns it as 0 to `count` - 1.
-    unsigned count(const std::string& what, std::string_view text, unsigned first, unsigned count) const;
+    std::int64_t integer(const std::string& what, std::string_view text) const;
+
+    /// A number that counts from `first` as 0 to `count` - 1.
+    unsigned count(const std::string& what, std::int64_t number, unsigned first, unsigned count) const;
+
+    /// Checks a place that values of the dump belong to.
+    StepPlace placeOf(const NamedPlace& named, const NameMap& map, const Values& values) const;
 
     /// The dump of the block with this number as text.
     Dump& dumpOf(std::string_view number, const NameMap& map, DumpSink& sink) const;

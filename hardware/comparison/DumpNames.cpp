@@ -71,15 +71,24 @@ DumpNames namesOfVcd(std::istream& input, const std::string& name)
 {
     VcdWords file(input, name);
     DumpNames names;
+    unsigned inPackage = 0;  // depth of scopes in that of the model's package, whose constants are named as signals
     while (file.nextWord() && file.word() != "$enddefinitions") {
-        if (file.word() != "$var") {
-            continue;
+        if (file.word() == "$scope") {
+            file.expectWord("the kind of a scope");
+            inPackage += inPackage > 0 || file.expectWord("the name of a scope") == "morvik_pkg" ? 1U : 0U;
+        } else if (file.word() == "$upscope") {
+            inPackage -= inPackage > 0 ? 1U : 0U;
+        } else if (file.word() == "$var") {
+            file.goOn();
+            const std::string kind = file.expectWord("the kind of a variable");
+            const std::string width = file.expectWord("the width of a variable");
+            file.expectWord("the identifier of a variable");
+            const std::string variable = file.nameOfVariable();
+            if (kind != "parameter" && inPackage == 0) {
+                const unsigned bits = kind == "real" ? 0 : base::parseNumber<unsigned>(width).value_or(0);
+                add(names, {variable, bits}, file);
+            }
         }
-        file.goOn();
-        const bool isReal = file.expectWord("the kind of a variable") == "real";
-        const std::string width = file.expectWord("the width of a variable");
-        file.expectWord("the identifier of a variable");
-        add(names, {file.nameOfVariable(), isReal ? 0 : base::parseNumber<unsigned>(width).value_or(0)}, file);
     }
     return names;
 }

@@ -166,7 +166,7 @@ private:
             fail("\"signals\" is not an object");
         }
         for (const auto& [theirs, ours] : value.items()) {
-            const std::vector<Meaning> meanings = isListOfNames(ours) ? twins(theirs, ours) : meaningsOf(theirs, ours);
+            const std::vector<Meaning> meanings = meaningsOf(theirs, ours);
             if (NamePattern::isPattern(theirs)) {
                 itsMap.patterns.push_back({NamePattern(theirs), meanings});
             } else {
@@ -183,7 +183,13 @@ private:
         return value.is_array() && (value.empty() || !value[0].is_object());
     }
 
-    std::vector<Meaning> twins(const std::string& theirs, const Json& ours)
+    /// A signal, or the first of two that the name stands for.
+    std::string signalOrTwins(const std::string& theirs, const Json& ours)
+    {
+        return ours.is_array() ? twins(theirs, ours) : signalText(theirs, ours);
+    }
+
+    std::string twins(const std::string& theirs, const Json& ours)
     {
         const auto signal = ours.size() == 2 ? signalOf(ours[0]) : std::nullopt;
         if (!signal || twinOf(*signal) == *signal || signalOf(ours[1]) != twinOf(*signal)) {
@@ -192,7 +198,7 @@ private:
                  "g1 and g2");
         }
         itsMap.standIns[twinOf(*signal)] = theirs;
-        return {{passSignals[*signal].name, {}}};
+        return passSignals[*signal].name;
     }
 
     std::vector<Element> elementsOf(const std::string& theirs, const std::vector<Meaning>& meanings) const
@@ -245,7 +251,7 @@ private:
         if (ours.is_object()) {
             return objectMeanings(theirs, ours);
         }
-        if (ours.is_array()) {
+        if (ours.is_array() && !isListOfNames(ours)) {
             std::vector<Meaning> all;
             for (const Json& each : ours) {
                 if (!each.is_object()) {
@@ -256,7 +262,7 @@ private:
             }
             return all;
         }
-        return {{signalText(theirs, ours), {}}};
+        return {{signalOrTwins(theirs, ours), {}}};
     }
 
     /// What is particular to a name: {"signal": ..., "step": ..., ...} or {"packed": ..., ...}.
@@ -289,7 +295,7 @@ private:
         if (object.contains("packed")) {
             meanings = packedMeanings(theirs, object);
         } else {
-            meanings = {{signalText(theirs, object["signal"]), {}}};
+            meanings = {{signalOrTwins(theirs, object["signal"]), {}}};
         }
         for (Meaning& each : meanings) {
             each.second.timing = timing;
@@ -327,7 +333,7 @@ private:
     }
 
     /// A list of signals, all signals of a kind, or one signal of several segments or units.
-    std::vector<Meaning> packedMeanings(const std::string& theirs, const Json& object) const
+    std::vector<Meaning> packedMeanings(const std::string& theirs, const Json& object)
     {
         const unsigned segments =
             object.contains("segments") ? count("segments", object["segments"], 1, mostTogether) : 1;
@@ -349,7 +355,7 @@ private:
         return meanings;
     }
 
-    std::vector<std::string> packedSignals(const std::string& theirs, const Json& packed) const
+    std::vector<std::string> packedSignals(const std::string& theirs, const Json& packed)
     {
         std::vector<std::string> signals;
         for (unsigned signal = 0; signal < signalCount; ++signal) {
@@ -359,7 +365,7 @@ private:
         }
         if (packed.is_array()) {
             for (const Json& each : packed) {
-                signals.push_back(signalText(theirs, each));
+                signals.push_back(signalOrTwins(theirs, each));
             }
         } else if (signals.empty()) {
             signals.push_back(signalText(theirs, packed));

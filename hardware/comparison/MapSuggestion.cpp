@@ -80,8 +80,9 @@ bool hasAny(const Words& words, const Words& wanted)
     });
 }
 
-/// What designers call the values of a stage. bm is a branch or a backward metric: the number of them tells.
-std::optional<Stage> stageNamed(const Words& words, unsigned highestNumber)
+/// What designers call the values of a stage. bm is a branch or a backward metric: the number of them tells, or the
+/// bits of all, as a branch metric is narrower than a state metric.
+std::optional<Stage> stageNamed(const Words& words, unsigned highestNumber, unsigned bits)
 {
     static const std::array<std::pair<Stage, Words>, 6> names = {
         {{Stage::extrinsic, {"extrinsic", "ext", "extr", "le", "lext"}},
@@ -96,7 +97,8 @@ std::optional<Stage> stageNamed(const Words& words, unsigned highestNumber)
         }
     }
     if (hasAny(words, {"bm"})) {
-        return highestNumber >= signalsOf(Stage::branch).count ? Stage::backward : Stage::branch;
+        constexpr unsigned branches = signalsOf(Stage::branch).count;
+        return highestNumber >= branches || bits > branches * passBits ? Stage::backward : Stage::branch;
     }
     return std::nullopt;
 }
@@ -156,17 +158,28 @@ private:
     void placeControl(const std::string& key, const Words& usual)
     {
         for (const std::string& wanted : usual) {
-            for (const DumpName& each : itsNames.names) {
-                if (wordsOf(each.name) == wordsOf(wanted)) {
-                    itsPlaced.insert(each.name);
-                    if (each.name != key) {
-                        itsColumns[key] = each.name;
-                    }
-                    return;
+            if (const DumpName* const found = called(wanted)) {
+                itsPlaced.insert(found->name);
+                if (found->name != key) {
+                    itsColumns[key] = found->name;
                 }
+                return;
             }
         }
         itsNotes.push_back("no name looks like that of the " + (key == "step" ? key : "half-iteration"));
+    }
+
+    /// The name itself, or another one of the same words: k is a step rather than K, which may be the block size.
+    const DumpName* called(const std::string& wanted) const
+    {
+        const DumpName* alike = nullptr;
+        for (const DumpName& each : itsNames.names) {
+            if (each.name == wanted) {
+                return &each;
+            }
+            alike = alike == nullptr && wordsOf(each.name) == wordsOf(wanted) ? &each : alike;
+        }
+        return alike;
     }
 
     void placeSignal(const DumpName& name)
@@ -176,7 +189,7 @@ private:
         }
         const Parts parts = partsOf(name.name);
         const unsigned highest = parts.number ? itsHighest.at(formOf(parts)) : 0;
-        const auto stage = stageNamed(parts.words, highest);
+        const auto stage = stageNamed(parts.words, highest, name.bits);
         if (!stage || !placeInStage(name, parts, *stage)) {
             leaveOut(name.name);
         }
@@ -223,7 +236,10 @@ private:
     /// Rows of CSV may have no names that a map does not know.
     void leaveOut(const std::string& name)
     {
-        itsNotes.push_back("not placed: " + name);
+        const std::string note = "not placed: " + name;
+        if (itsNotes.empty() || itsNotes.back() != note) {  // names alike but for their widths follow each other
+            itsNotes.push_back(note);
+        }
         if (itsNames.hasRows) {
             itsSignals[name] = nullptr;
         }

@@ -3,6 +3,7 @@
 #define MORVIK_HARDWARE_COMPARISON_PLACEHISTORY_H
 
 #include <cstddef>
+#include <cstdint>
 #include <deque>
 #include <optional>
 
@@ -12,8 +13,14 @@ namespace morvik::comparison {
 struct StepPlace {
     unsigned pass;
     unsigned step;
+};
 
-    bool operator==(const StepPlace& other) const
+/// The same as the dump counts them. Between values they may be anything: counters of a core at rest.
+struct NamedPlace {
+    std::int64_t pass;
+    std::int64_t step;
+
+    bool operator==(const NamedPlace& other) const
     {
         return pass == other.pass && step == other.step;
     }
@@ -25,7 +32,7 @@ public:
     explicit PlaceHistory(unsigned delay) : itsDelay(delay) {}
 
     /// A new clock begins.
-    void begin(std::optional<StepPlace> place)
+    void begin(std::optional<NamedPlace> place)
     {
         itsPlaces.push_back(place);
         if (itsPlaces.size() > std::size_t{itsDelay} + 1) {
@@ -34,7 +41,7 @@ public:
     }
 
     /// Registers have settled within the clock.
-    void settle(std::optional<StepPlace> place)
+    void settle(std::optional<NamedPlace> place)
     {
         if (!itsPlaces.empty()) {
             itsPlaces.back() = place;
@@ -42,7 +49,7 @@ public:
     }
 
     /// The dump names this place, a new step if it is another one.
-    void follow(std::optional<StepPlace> place)
+    void follow(std::optional<NamedPlace> place)
     {
         if (place && (itsPlaces.empty() || !(itsPlaces.back() == place))) {
             begin(place);
@@ -50,14 +57,14 @@ public:
     }
 
     /// The place of values that come late.
-    std::optional<StepPlace> delayed() const
+    std::optional<NamedPlace> delayed() const
     {
         return itsPlaces.size() > itsDelay ? itsPlaces.front() : std::nullopt;
     }
 
 private:
     unsigned itsDelay;
-    std::deque<std::optional<StepPlace>> itsPlaces;
+    std::deque<std::optional<NamedPlace>> itsPlaces;
 };
 
 }  // namespace morvik::comparison

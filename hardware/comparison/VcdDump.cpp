@@ -175,7 +175,7 @@ private:
         for (auto each = itsScopes.variables().end() - static_cast<std::ptrdiff_t>(kept);
              each != itsScopes.variables().end();
              ++each) {
-            setBits(*each, itsFile.count("width", width, 1, 65536) + 1);
+            setBits(*each, itsFile.count("width", itsFile.integer("width", width), 1, 65536) + 1);
         }
     }
 
@@ -350,29 +350,28 @@ private:
     {
         const VcdGroup& group = itsScopes.groups()[number];
         const bool isOfABlock = !itsHasBlocks || beginBlockOf(group);
-        const auto place = isOfABlock ? placeOf(number) : std::nullopt;
-        if (!place || (group.valid != nobody && valueOf(group.valid).value_or(0) != 1)) {
+        const auto named = isOfABlock ? placeOf(number) : std::nullopt;
+        if (!named || (group.valid != nobody && valueOf(group.valid).value_or(0) != 1)) {
             return;
         }
+        const StepPlace place = itsFile.placeOf(*named, itsMap, itsDump->values);
         for (const unsigned signal : group.signals) {
-            if (const auto own = itsDump->placeOf(*place, itsScopes.variables()[signal].element)) {
+            if (const auto own = itsDump->placeOf(place, itsScopes.variables()[signal].element)) {
                 keepValue(signal, *own);
             }
         }
     }
 
     /// Where the group's values belong: now, or before a delay.
-    std::optional<StepPlace> placeOf(unsigned number)
+    std::optional<NamedPlace> placeOf(unsigned number)
     {
         const VcdGroup& group = itsScopes.groups()[number];
         const Timing& timing = itsMap.timings[group.timing];
         const auto pass = valueOf(group.pass);
         const auto step = valueOf(group.step);
-        std::optional<StepPlace> place;
+        std::optional<NamedPlace> place;
         if (pass && step) {
-            const Values& values = itsDump->values;
-            place = {itsFile.count("half-iteration", std::to_string(*pass), itsMap.firstPass, values.passes()),
-                     itsFile.count("step", std::to_string(*step), itsMap.firstStep, values.steps())};
+            place = {*pass, *step};
         }
         if (timing.delay == 0) {
             return place;

@@ -213,6 +213,17 @@ module wrong_use_tb;
             failures++;
     endfunction
 
+    // Registers side by side, of which the first is in the lowest bits.
+    function automatic void unpack();
+        metrics_t row;
+        row = metrics_of({12'hfff, 12'h7ff, 12'h800, 12'h000, 12'h004, 12'h003, 12'h002, 12'h801});
+        if (row[0] != -2047 || row[1] != 2 || row[5] != -2048 || row[6] != 2047 || row[7] != -1)
+            failures++;
+        row = branches_of({8'h7f, 8'h80, 8'hff, 8'h01});
+        if (row[0] != 1 || row[1] != -1 || row[2] != -128 || row[3] != 127 || row[4] != 0)
+            failures++;
+    endfunction
+
     // The class unchanged.
     function automatic void report();
         morvik_decoder model;
@@ -247,6 +258,7 @@ module wrong_use_tb;
             refuse_checks();
             use_units();
             refuse_units();
+            unpack();
             warn();
             call_with_null();
         end

@@ -89,6 +89,51 @@ TEST(MappedDump, TakesStepAndValidOfASignal)
                   mapOf(map));
 }
 
+// Counters of a core at rest may hold anything, such as a half-iteration of all ones.
+TEST(MappedDump, LooksAtPlacesOnlyWhereValuesAreValid)
+{
+    const NameMap map =
+        mapOf(R"({"valid": "ok", "signals": {"l": {"signal": "llr", "delay_steps": 1}, "a": "alpha0"}})");
+    const std::string variables =
+        "$var wire 13 s step $end\n$var wire 1 o ok $end\n$var wire 12 l l $end\n"
+        "$var wire 12 a a $end\n";
+    const Dump dump = read(readVcd,
+                           vcdOf(variables,
+                                 "#0\nb11111 h\nb11111111 s\n0o\nb0 l\nb0 a\n#1\n1o\nb0 h\nb0 s\nb1 a\n0o\n"
+                                 "#2\nb1 s\nb10 l\n1o\n#3\n0o\nb1111111111 s\n"),
+                           map);
+    EXPECT_EQ(dump.values.at({0, llr, 0}), 2);
+    EXPECT_EQ(dump.values.at({0, alpha0, 1}), 1);
+    const Dump rows =
+        read(readCsv, "half_iteration,step,ok,l,a\n31,255,0,9,9\n0,0,0,9,9\n0,1,1,2,1\n31,255,0,9,9\n", map);
+    EXPECT_EQ(rows.values.at({0, llr, 0}), 2);
+    EXPECT_EQ(rows.values.at({0, alpha0, 1}), 1);
+    expectRefused(readCsv,
+                  "half_iteration,step,ok,l,a\n0,255,0,9,9\n0,1,1,2,1\n",
+                  R"(dump:3: step "255" is not allowed, expected an integer from 0 to 42)",
+                  map);
+    expectRefused(readCsv,
+                  "half_iteration,step,ok,l,a\nx0,one,1,2,1\n",
+                  R"(dump:2: half-iteration "x0" is not allowed, expected an integer)",
+                  map);
+}
+
+// The equal branch metrics are one register.
+TEST(MappedDump, TakesANameForTwinsWithAPlaceOfItsOwn)
+{
+    constexpr unsigned g0 = morvik::signalsOf(morvik::Stage::branch).first;
+    const Dump dump =
+        read(readCsv, "half_iteration,k,n,plus,both\n0,0,9,5,0fd\n", mapOf(R"({"columns": {"step": "k"}, "signals": {
+                               "plus": {"signal": ["g0", "g3"], "step": "n"},
+                               "both": {"packed": [["g1", "g2"], "alpha0"], "bits": 4}},
+                               "numbers": "hex"})"));
+    EXPECT_EQ(dump.values.at({0, g0, 9}), 5);
+    EXPECT_EQ(dump.values.at({0, g0 + 3, 9}), 5);
+    EXPECT_EQ(dump.values.at({0, g0 + 1, 0}), -3);
+    EXPECT_EQ(dump.values.at({0, g0 + 2, 0}), -3);
+    EXPECT_EQ(dump.values.at({0, alpha0, 0}), -1);
+}
+
 // A memory port carries forward metrics, then backward ones.
 TEST(MappedDump, TakesANameForSeveralSignals)
 {
@@ -280,6 +325,21 @@ TEST(SuggestedMap, PlacesTheUsualNamesOfAWaveform)
     EXPECT_EQ(dump.values.at({0, morvik::signalsOf(morvik::Stage::branch).first + 1, 1}), 7);
     EXPECT_EQ(dump.values.at({0, morvik::signalsOf(morvik::Stage::extrinsic).first, 1}), 1);
     EXPECT_EQ(dump.values.at({0, llr, 1}), 2);
+}
+
+// Beside the test bench, a waveform has the constants of the model's package, which are called as the signals are, and
+// those of the core.
+TEST(SuggestedMap, LeavesConstantsOut)
+{
+    const std::string text = vcdOf(
+        "$scope module morvik_pkg $end\n$scope module inner $end\n$var wire 32 0 SIGNAL_BETA $end\n$upscope $end\n"
+        "$var wire 32 1 SIGNAL_LLR $end\n$upscope $end\n$var parameter 32 2 LLR_BITS $end\n"
+        "$var wire 13 3 K $end\n$var wire 13 k k $end\n$var wire 96 b bm [95:0] $end\n$var wire 12 l app_q $end\n",
+        "");
+    std::istringstream input(text);
+    EXPECT_EQ(suggestMap(namesOfVcd(input, "dump")).json,
+              "{\n  \"columns\": {\n    \"step\": \"k\"\n  },\n  \"signals\": {\n"
+              "    \"app_q\": \"llr\",\n    \"bm\": {\n      \"packed\": \"beta\"\n    }\n  }\n}\n");
 }
 
 TEST(SuggestedMap, PlacesTheNamesOfRows)
