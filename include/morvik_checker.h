@@ -117,6 +117,13 @@ MORVIK_CHECKER_API void morvik_checker_put(morvik_checker* checker, int32_t sys,
  */
 MORVIK_CHECKER_API int32_t morvik_checker_start(morvik_checker* checker, int32_t iterations);
 
+/** Ends the block, as morvik_checker_start does when it refuses the next one: for an environment that refuses a block
+ * itself. What has been put and observed is forgotten.
+ *
+ * @param checker    a checker
+ */
+MORVIK_CHECKER_API void morvik_checker_forget(morvik_checker* checker);
+
 /** The number of a signal.
  *
  * @param name    "intrinsic", "g0" to "g3", "alpha0" to "alpha7", "beta0" to "beta7", "llr", "extrinsic"; "g", "alpha"

@@ -340,6 +340,7 @@ int createChecker(const std::vector<vpiHandle>& arguments)
 int startChecker(const std::vector<vpiHandle>& arguments)
 {
     morvik_checker* const checker = checkerOf(arguments[0]);
+    morvik_checker_forget(checker);  // the arguments may be refused
     const int iterations = argument(arguments[5], "The number of iterations");
     putStreams({arguments[1], arguments[2], arguments[3]},
                argument(arguments[4], "The size"),

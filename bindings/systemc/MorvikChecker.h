@@ -35,6 +35,7 @@ public:
               const std::vector<std::int32_t>& par2,
               int iterations)
     {
+        morvik_checker_forget(itsChecker.get());
         if (sys.size() != par1.size() || sys.size() != par2.size()) {
             SC_REPORT_ERROR("morvik",
                             ("The streams differ in length: sys has " + std::to_string(sys.size()) + " values, par1 " +

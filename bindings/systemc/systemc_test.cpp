@@ -115,6 +115,11 @@ void checkChecker()
         "morvik: ERROR:checker:llr of half-iteration 1, step 4: expected " + std::to_string(one.ratio(4)) + ", got x");
     expect("seen", std::to_string(one.seen(MORVIK_CHECKER_LLR)), "2");
     expect("seen by the other", std::to_string(other.seen(MORVIK_CHECKER_LLR)), "0");
+    // A refused block is none: values are not those of the block before.
+    expectAnswer(one.start(block.sys, {}, block.par2, 8),
+                 MORVIK_CHECKER_REFUSED,
+                 "morvik: The streams differ in length: sys has 44 values, par1 0, par2 44");
+    expectAnswer(one.observe(MORVIK_CHECKER_LLR, 0, 0, 0), MORVIK_CHECKER_REFUSED, noBlock);
 }
 
 }  // namespace

@@ -23,6 +23,7 @@ package morvik_pkg;
     import "DPI-C" function void morvik_checker_put(
         input chandle handle, input int sys, input int par1, input int par2);
     import "DPI-C" function int morvik_checker_start(input chandle handle, input int iterations);
+    import "DPI-C" function void morvik_checker_forget(input chandle handle);
     import "DPI-C" function int morvik_checker_signal(input string name);
     import "DPI-C" function int morvik_checker_observe(
         input chandle handle, input int signal, input int half_iteration, input int step, input int value);
@@ -241,6 +242,7 @@ package morvik_pkg;
         );
             int result;
             message = "";
+            morvik_checker_forget(handle);
             if (!are_alike(sys.size(), par1.size(), par2.size()))
                 return CHECKER_REFUSED;
             for (int i = 0; i < sys.size(); i++)

@@ -97,6 +97,7 @@ package morvik_checker_pkg is
     procedure morvik_vhdl_checker_destroy (checker : in integer);
     impure function morvik_vhdl_checker_is_open (checker : integer) return integer;
     procedure morvik_vhdl_checker_put (checker, sys, par1, par2 : in integer);
+    procedure morvik_vhdl_checker_forget (checker : in integer);
     impure function morvik_vhdl_checker_start (checker, iterations : integer) return integer;
     impure function morvik_vhdl_checker_observe (checker, number, half_iteration, step, value : integer) return integer;
     impure function morvik_vhdl_checker_observe_row (
@@ -113,6 +114,7 @@ package morvik_checker_pkg is
     attribute foreign of morvik_vhdl_checker_destroy : procedure is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_destroy";
     attribute foreign of morvik_vhdl_checker_is_open : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_is_open";
     attribute foreign of morvik_vhdl_checker_put : procedure is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_put";
+    attribute foreign of morvik_vhdl_checker_forget : procedure is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_forget";
     attribute foreign of morvik_vhdl_checker_start : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_start";
     attribute foreign of morvik_vhdl_checker_observe : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_observe";
     attribute foreign of morvik_vhdl_checker_observe_row : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_observe_row";
@@ -179,6 +181,7 @@ package body morvik_checker_pkg is
         alias par2_of : morvik_soft_values(0 to par2'length - 1) is par2;
     begin
         status := morvik_refused;
+        morvik_vhdl_checker_forget(checker);
         if sys'length /= par1'length or sys'length /= par2'length then
             morvik_report_line("ERROR:binding:The streams differ in length: sys has " & integer'image(sys'length) &
                 " values, par1 " & integer'image(par1'length) & ", par2 " & integer'image(par2'length));
@@ -326,6 +329,11 @@ package body morvik_checker_pkg is
     begin
         report "morvik_vhdl_checker_put is foreign" severity failure;
     end procedure morvik_vhdl_checker_put;
+
+    procedure morvik_vhdl_checker_forget (checker : in integer) is
+    begin
+        report "morvik_vhdl_checker_forget is foreign" severity failure;
+    end procedure morvik_vhdl_checker_forget;
 
     impure function morvik_vhdl_checker_start (checker, iterations : integer) return integer is
     begin

@@ -191,6 +191,11 @@ MORVIK_API void morvik_vhdl_checker_put(std::int32_t checker, std::int32_t sys, 
     morvik_checker_put(findChecker(checker), sys, par1, par2);
 }
 
+MORVIK_API void morvik_vhdl_checker_forget(std::int32_t checker)
+{
+    morvik_checker_forget(findChecker(checker));
+}
+
 MORVIK_API std::int32_t morvik_vhdl_checker_start(std::int32_t checker, std::int32_t iterations)
 {
     return morvik_checker_start(findChecker(checker), iterations);

@@ -151,14 +151,20 @@ std::int32_t observe(morvik_checker& checker, Place place, unsigned count, const
     return agrees ? MORVIK_CHECKER_AGREES : MORVIK_CHECKER_DIFFERS;
 }
 
-/// The positions that were put, which are forgotten.
-morvik::SoftBlock taken(morvik_checker& checker)
+void forgetPositions(morvik_checker& checker)
 {
-    const std::size_t positions = std::exchange(checker.positions, 0U);
-    morvik::SoftBlock block = checker.block;
+    checker.positions = 0;
     for (auto* stream : {&checker.block.rsc1Sys, &checker.block.rsc1Par, &checker.block.rsc2Par}) {
         stream->clear();
     }
+}
+
+/// The positions that were put, which are forgotten.
+morvik::SoftBlock taken(morvik_checker& checker)
+{
+    const std::size_t positions = checker.positions;
+    morvik::SoftBlock block = checker.block;
+    forgetPositions(checker);
     if (positions == 0) {
         throw Wrong{"The block is empty, but a block of K bits has K + 4 soft values in each stream"};
     }
@@ -236,6 +242,17 @@ int32_t morvik_checker_start(morvik_checker* checker, int32_t iterations)
         startOn(each, block, static_cast<unsigned>(iterations));
         return MORVIK_CHECKER_AGREES;
     });
+}
+
+void morvik_checker_forget(morvik_checker* checker)
+{
+    if (checker == nullptr) {
+        return;
+    }
+    forgetPositions(*checker);
+    if (checker->checker) {
+        checker->checker->forget();
+    }
 }
 
 int32_t morvik_checker_signal(const char* name)

@@ -137,6 +137,10 @@ module wrong_use_tb;
         expect_answer(other, other.seen(SIGNAL_BETA), 0, "");
         expect_answer(check, check.seen(SIGNAL_BETA), 1, "ERROR:checker:Values are missing");
         other.destroy();
+        // A refused block is none: values are not those of the block before.
+        expect_answer(check, check.start(values(44), values(43), values(44), 8), CHECKER_REFUSED,
+            "ERROR:binding:The streams differ in length: sys has 44 values, par1 43, par2 44");
+        expect_answer(check, check.observe(SIGNAL_LLR, 0, 0, 0), CHECKER_REFUSED, no_block);
         check.destroy();
         expect_answer(check, check.observe(SIGNAL_LLR, 0, 0, 0), CHECKER_REFUSED,
             "ERROR:binding:There is no checker: it was destroyed, or there is no memory for it");

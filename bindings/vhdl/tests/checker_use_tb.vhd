@@ -79,6 +79,12 @@ begin
         morvik_observe(one, morvik_llr, 1, 3, morvik_ratio(one, 3), answer);
         assert answer = morvik_agrees severity failure;
 
+        report "a refused block is none";
+        morvik_checker_start(one, sys, par1(0 to 42), par2, answer);
+        assert answer = morvik_refused severity failure;
+        morvik_observe(one, morvik_llr, 1, 3, 0, answer);
+        assert answer = morvik_refused severity failure;
+
         report "destroyed";
         morvik_checker_destroy(one);
         morvik_checker_destroy(one);

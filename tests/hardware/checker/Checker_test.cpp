@@ -251,6 +251,20 @@ TEST(Checker, NeedsABlockFirst)
     EXPECT_EQ(messagesOf(checker), (Messages{refusal, refusal}));
 }
 
+TEST(Checker, ForgetsItsBlockWhenTold)
+{
+    const Checker checker = started();
+    morvik_checker_put(checker.get(), 1, 2, 3);
+    morvik_checker_forget(checker.get());
+    EXPECT_EQ(morvik_checker_standing(checker.get()), MORVIK_CHECKER_REFUSED);
+    EXPECT_EQ(morvik_checker_expected(checker.get(), MORVIK_CHECKER_LLR), 0);
+    EXPECT_EQ(messagesOf(checker), Messages());
+    EXPECT_EQ(start(checker, noisyBlock(1), 2), MORVIK_CHECKER_AGREES);
+    const Checker refused = makeChecker(3, 1);
+    morvik_checker_forget(refused.get());
+    EXPECT_EQ(messagesOf(refused).size(), 1U);
+}
+
 TEST(Checker, RefusesBlocksThatTheCoreDoesNotDecode)
 {
     const Checker checker = started();
@@ -306,6 +320,7 @@ TEST(Checker, PassesTheModelsWarningsOn)
 TEST(Checker, TakesNullForOneThatIsNotOpen)
 {
     morvik_checker_put(nullptr, 0, 0, 0);
+    morvik_checker_forget(nullptr);
     morvik_checker_destroy(nullptr);
     EXPECT_EQ(morvik_checker_is_open(nullptr), 0);
     EXPECT_EQ(morvik_checker_start(nullptr, 1), MORVIK_CHECKER_REFUSED);
