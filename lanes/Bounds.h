@@ -38,6 +38,18 @@ constexpr int unlikely = rules::knownMetric<int>(1, rules::smallestOf(rules::sta
 /// The bits of a metric that a border column keeps.
 constexpr int borderMask = rules::integerOf(rules::borderMask, rules::stateAlignment);
 
+/// Corrections of MOD# are kept for every fourth magnitude, the finest resolution of the hardware's table (rule 9). The
+/// last entry is 0 and serves all greater magnitudes.
+constexpr int correctionEntries = 8;
+constexpr int correctionStepBits = 2;
+constexpr int correctionStep = 1 << correctionStepBits;
+
+/// The entry for a difference, in steps rounded down. The magnitude of a negative one is its inversion (rule 9).
+constexpr int correctionEntry(int steps)
+{
+    return steps >= 0 ? steps : ~steps;
+}
+
 }  // namespace morvik::lanes
 
 #endif

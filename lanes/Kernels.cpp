@@ -1,6 +1,7 @@
 // Kernels: the lanes, compiled once for each instruction set (lanes/CMakeLists.txt).
 #include "Kernels.h"
 
+#include <algorithm>
 #include <iterator>
 
 #include "Pass.h"
@@ -14,8 +15,8 @@ namespace {
 template <class OfShape>
 struct KernelOf;
 
-template <unsigned count, unsigned vectors, unsigned mostAbreast>
-struct KernelOf<Shape<count, vectors, mostAbreast>> {
+template <unsigned count, unsigned vectors, unsigned plainAbreast, unsigned correctedAbreast>
+struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
     using Permutation = Machine::Permutation<count>;
 
     template <class Input>
@@ -41,26 +42,54 @@ struct KernelOf<Shape<count, vectors, mostAbreast>> {
         if (from == 0) {
             interleave(workspace);
         }
-        // If the first two windows differ in length, others are equal only by chance.
-        const bool abreast = workspace.windows > 1 && workspace.windowStart[2] == 2 * workspace.windowStart[1];
-        if (mostAbreast > 1 && abreast) {
-            decodeAbreast<mostAbreast>(workspace, algorithm, from, to);
-        } else {
-            decodeAbreast<1>(workspace, algorithm, from, to);
+        switch (algorithm) {
+        case Algorithm::greatest:
+            return decodeBy<Greatest, plainAbreast, Extrinsic::whole>(workspace, from, to);
+        case Algorithm::greatestScaled:
+            return decodeBy<Greatest, plainAbreast, Extrinsic::scaled>(workspace, from, to);
+        case Algorithm::corrected:
+            return decodeBy<Corrected, correctedAbreast, Extrinsic::whole>(workspace, from, to);
         }
     }
 
-    template <unsigned abreast>
-    static void decodeAbreast(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to)
+    template <template <unsigned> class RuleOf, unsigned abreast, Extrinsic extrinsic>
+    static void decodeBy(const Workspace& workspace, unsigned from, unsigned to)
     {
-        switch (algorithm) {
-        case Algorithm::greatest:
-            return runPasses<Greatest, abreast, Extrinsic::whole>(workspace, from, to);
-        case Algorithm::greatestScaled:
-            return runPasses<Greatest, abreast, Extrinsic::scaled>(workspace, from, to);
-        case Algorithm::corrected:
-            return runPasses<Corrected, abreast, Extrinsic::whole>(workspace, from, to);
+        if constexpr (abreast > 1) {
+            if (!pays(workspace, abreast)) {
+                return decodeBy<RuleOf, abreast / 2, extrinsic>(workspace, from, to);
+            }
         }
+        runPasses<RuleOf, abreast, extrinsic>(workspace, from, to);
+    }
+
+    /// Whether `abreast` windows should run side by side rather than half as many. The last window may start from a
+    /// column that the first one reaches, and then runs after it (Pass.h). Windows of different lengths cannot run side
+    /// by side, so wider vectors may repeat windows: against single ones that pays up to two fifths more steps, else up
+    /// to none.
+    static bool pays(const Workspace& workspace, unsigned abreast)
+    {
+        if (workspace.windows > 2 && workspace.windows <= abreast) {
+            return false;
+        }
+        const unsigned run = stepsRun(workspace, abreast);
+        return abreast == 2 ? 5 * run <= 7 * workspace.steps : run <= stepsRun(workspace, abreast / 2);
+    }
+
+    /// Returns how many steps of a segment run if `abreast` windows run side by side, repeated ones included.
+    static unsigned stepsRun(const Workspace& workspace, unsigned abreast)
+    {
+        const unsigned* const start = workspace.windowStart;
+        unsigned run = 0;
+        for (unsigned r = 0; r < workspace.windows;) {
+            const unsigned end = std::min(r + abreast, workspace.windows);
+            const unsigned length = start[r + 1] - start[r];
+            run += abreast * length;
+            do {
+                ++r;
+            } while (r < end && start[r + 1] - start[r] == length);
+        }
+        return run;
     }
 
     /// Fills decoder 1's systematic values: decoder 0's in interleaved order.
@@ -93,7 +122,8 @@ struct KernelOf<Shape<count, vectors, mostAbreast>> {
         }
     }
 
-    static constexpr unsigned slotBytes = Pass<Greatest, count, vectors, mostAbreast, Extrinsic::whole>::slotBytes;
+    static constexpr unsigned slotBytes =
+        Pass<Greatest, count, vectors, std::max(plainAbreast, correctedAbreast), Extrinsic::whole>::slotBytes;
     /// For the larger rule, which keeps a pending correction with each metric.
     static constexpr unsigned forwardBytes = Pass<Corrected, count, vectors, 1, Extrinsic::whole>::forwardBytes;
 

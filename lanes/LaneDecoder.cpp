@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <utility>
 
-#include "Bounds.h"
 #include "InstructionSets.h"
 #include "Unaligned.h"
 #include "rules/Interleaver.h"

@@ -8,6 +8,7 @@
 #include <memory>
 #include <vector>
 
+#include "Bounds.h"
 #include "Kernels.h"
 #include "LaneOrder.h"
 #include "rules/Cut.h"
@@ -29,9 +30,8 @@ struct Streams {
 /// The three streams of a block as loaded.
 using LoadedBlock = std::array<std::vector<std::int16_t>, 3>;
 
-/// The correction table in eighths, indexed by a quarter of the difference's magnitude in eighths. The last entry also
-/// serves all greater magnitudes.
-using CorrectionTable = std::array<std::uint8_t, 16>;
+/// The correction table in eighths, for every correctionStep eighths of the difference's magnitude (Bounds.h).
+using CorrectionTable = std::array<std::uint8_t, correctionEntries>;
 
 /// Permutations (Workspace.h) under construction.
 struct SlicePermutations {

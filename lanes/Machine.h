@@ -7,7 +7,7 @@
 //   holdsTwoRecursions      whether its registers hold two recursions at once
 //   tileHalves              halves of the widest tile that it transposes efficiently (Transpose.h)
 //   Permutation<count>      gathers a vector with permuted lanes
-//   Table<count>            looks up a table of sixteen values in each lane
+//   Corrections<count>      looks up the correction of a decision difference in each lane
 //   scaledHalf(a)           half of a scaled, rounded down: floor(3 a / 8), for any a with 3 a within 16 bits
 //   saturated(values)       eight 32-bit values, saturated to 16 bits
 //
@@ -20,6 +20,7 @@
 
 #include <utility>
 
+#include "Bounds.h"
 #include "Words.h"
 #include "rules/Algorithms.h"
 
@@ -29,8 +30,9 @@
 
 namespace morvik::lanes::MORVIK_LANES {
 
-/// Slices of `vectors` vectors of `count` lanes; up to `abreast` windows of one vector run side by side.
-template <unsigned count, unsigned vectors, unsigned abreast = 1>
+/// Slices of `vectors` vectors of `count` lanes. So many windows of one vector run side by side at most: `abreast`,
+/// with corrections `correctedAbreast`.
+template <unsigned count, unsigned vectors, unsigned abreast = 1, unsigned correctedAbreast = abreast>
 struct Shape {
 };
 
@@ -70,22 +72,30 @@ struct Portable {
         }
     };
 
+    /// Sums up the drops from entry to entry that the difference does not reach: a look-up of each lane would not
+    /// vectorise.
     template <unsigned count>
-    class Table {
+    class Corrections {
     public:
-        explicit MORVIK_INLINE Table(const std::uint8_t* entries) : itsEntries(entries) {}
+        explicit MORVIK_INLINE Corrections(const std::uint8_t* entries) : itsEntries(entries) {}
 
-        /// The entries at `index`, 0 to 15.
-        MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
+        MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
         {
-            Eighths<count> result{};
-            for (unsigned lane = 0; lane < count; ++lane) {
-                result.v[lane] = itsEntries[index.v[lane]];
+            const Eighths<count> magnitude = max(difference, Eighths<count>::of(-1) - difference);  // -1 reads as 0
+            Eighths<count> sum{};
+            for (int i = 0; i < correctionEntries - 1; ++i) {
+                const Eighths<count> drop = Eighths<count>::of(itsEntries[i] - itsEntries[i + 1]);
+                sum = sum + (drop & below(magnitude, correctionStep * (i + 1)));
             }
-            return result;
+            return sum;
         }
 
     private:
+        static MORVIK_INLINE Eighths<count> below(Eighths<count> a, int limit)
+        {
+            return {a.v < Eighths<count>::of(limit).v};
+        }
+
         const std::uint8_t* itsEntries;
     };
 
@@ -169,22 +179,25 @@ struct Ssse3 : Sse2 {
         }
     };
 
-    /// The sixteen entries fit the sixteen bytes of a shuffle.
+    /// The entries for both signs fit the sixteen bytes of a shuffle. The first one is 0 and so serves the upper bytes
+    /// of the index.
     template <unsigned count>
-    class Table {
+    class Corrections {
     public:
-        explicit MORVIK_INLINE Table(const std::uint8_t* entries)
+        explicit MORVIK_INLINE Corrections(const std::uint8_t* entries)
         {
-            for (unsigned lane = 0; lane < count; ++lane) {
-                std::memcpy(reinterpret_cast<char*>(&itsEntries) + 2 * lane, entries + 2 * lane % 16, 2);
+            std::uint8_t bytes[sizeof itsEntries];
+            for (unsigned i = 0; i < sizeof bytes; ++i) {
+                bytes[i] = entries[correctionEntry(static_cast<int>(i % 16) - correctionEntries)];
             }
+            std::memcpy(&itsEntries, bytes, sizeof bytes);
         }
 
-        /// The entries at `index`, 0 to 15.
-        MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
+        MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
         {
-            // A byte shuffle gives 0 where the index byte's sign bit is set, here in the upper bytes.
-            return shuffleBytes(itsEntries, index | Eighths<count>::of(-0x8000));
+            constexpr int reach = correctionEntries * correctionStep;
+            const Eighths<count> index = clip(difference + Eighths<count>::of(reach), 0, 2 * reach - 1);
+            return shuffleBytes(itsEntries, index >> correctionStepBits);
         }
 
     private:
@@ -241,7 +254,7 @@ MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> index)
 
 struct Avx512 : Avx2 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16, 32>;
-    using Kernels = Shapes<Shape<8, 1, 2>, Shape<16, 1>, Shape<32, 1>, Shape<32, 2>>;
+    using Kernels = Shapes<Shape<8, 1, 2, 4>, Shape<16, 1, 1, 2>, Shape<32, 1>, Shape<32, 2>>;
     static constexpr bool holdsTwoRecursions = sizeof(void*) == 8;  // 32-bit code has eight registers
 
     /// An index word for each lane.
@@ -269,29 +282,33 @@ struct Avx512 : Avx2 {
         }
     };
 
-    /// An entry in each word.
+    /// The entries for both signs fit the words of a vector of sixteen lanes or more, whose permutation takes the low
+    /// bits of its index.
     template <unsigned count>
-    class WordTable {
+    class Corrections {
     public:
-        explicit MORVIK_INLINE WordTable(const std::uint8_t* entries)
+        explicit MORVIK_INLINE Corrections(const std::uint8_t* entries)
         {
-            for (unsigned lane = 0; lane < count; ++lane) {
-                itsEntries.v[lane] = entries[lane % 16];
+            for (unsigned i = 0; i < words; ++i) {
+                itsEntries.v[i] = entries[correctionEntry(static_cast<int>((i + 8) % 16) - correctionEntries)];
             }
         }
 
-        /// The entries at `index`, 0 to 15.
-        MORVIK_INLINE Eighths<count> at(Eighths<count> index) const
+        MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
         {
-            return permuteWords(itsEntries, index);
+            constexpr int reach = correctionEntries * correctionStep;
+            const Eighths<count> index = clip(difference, -reach, reach - 1) >> correctionStepBits;
+            if constexpr (count == words) {
+                return permuteWords(itsEntries, index);
+            } else {
+                return part<count, 0>(permuteWords(itsEntries, join(index, index)));
+            }
         }
 
     private:
-        Eighths<count> itsEntries;
+        static constexpr unsigned words = count < 16 ? 16 : count;
+        Eighths<words> itsEntries;
     };
-
-    template <unsigned count>
-    using Table = std::conditional_t<(count < 16), Avx2::Table<count>, WordTable<count>>;
 
     using Avx2::scaledHalf;
     static MORVIK_INLINE Eighths<32> scaledHalf(Eighths<32> a)

@@ -72,7 +72,8 @@ public:
     MORVIK_INLINE void run(bool isFirst) const
     {
         // The last window starts from the column that the next segment's first window reached: in this pass if there is
-        // a window in between, during which the hardware hands it on (rule 20), else in the pass before.
+        // a window in between, during which the hardware hands it on (rule 20), else in the pass before. So the last
+        // window must not run beside the first one if there are others.
         const bool handedWithin = !isFirst && w.windows > 2;
         hand(itsConstituent.alphaReached, w.before, itsConstituent.alphaStart, w.firstLanes);
         if (!handedWithin) {
@@ -84,11 +85,11 @@ public:
         Windows windows = windowsFrom(0, 0, 0, slotWords);
         runForward(windows);
         while (windows.length != 0) {
-            if (windows.r[0] == 2 && windows.v == 0 && handedWithin) {
-                handBack();
-            }
             const Windows next = following(windows);
             runWindows<ratios>(windows, next);
+            if (handedWithin && windows.r[0] == 0 && next.r[0] != 0) {
+                handBack();
+            }
             windows = next;
         }
         for (unsigned v = 0; v < vectors; ++v) {
@@ -145,12 +146,13 @@ private:
 
     MORVIK_INLINE void runForward(const Windows& windows) const
     {
-        const Column start = restoreForward(windows.v);
-        Column a = start;
+        Column a = restoreForward(windows.v);
+        Column start{};
         for (unsigned j = 0; j < abreast; ++j) {
             if (j > 0 && windows.r[j] == windows.r[j - 1]) {
                 a = start;
             }
+            start = a;
             forward(windows, j, a);
             a = broughtBack<Decision>(a);
         }
@@ -264,11 +266,18 @@ private:
 
     MORVIK_INLINE WideValue valuesAt(const Windows& windows, std::size_t i, const std::int16_t* slices) const
     {
-        const Value first = Value::load(slices + at(windows, 0, i) * count);
-        if constexpr (abreast == 1) {
-            return first;
+        return joined<0, abreast>([&](unsigned j)
+                                      MORVIK_INLINE_LAMBDA { return Value::load(slices + at(windows, j, i) * count); });
+    }
+
+    /// Joins valueOf(j) of windows `first` to first + many - 1.
+    template <unsigned first, unsigned many, class ValueOf>
+    static MORVIK_INLINE Eighths<many * count> joined(ValueOf valueOf)
+    {
+        if constexpr (many == 1) {
+            return valueOf(first);
         } else {
-            return join(first, Value::load(slices + at(windows, 1, i) * count));
+            return join(joined<first, many / 2>(valueOf), joined<first + many / 2, many / 2>(valueOf));
         }
     }
 
@@ -291,14 +300,10 @@ private:
     {
         WideColumn m{};
         rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA {
-            const std::int16_t* const metrics = itsConstituent.betaStart + state * lanesOfSlice + windows.v * count;
-            const Value first = Value::load(metrics + windows.r[0] * states * lanesOfSlice);
-            if constexpr (abreast == 1) {
-                m[state] = WideDecision::metric(first);
-            } else {
-                m[state] =
-                    WideDecision::metric(join(first, Value::load(metrics + windows.r[1] * states * lanesOfSlice)));
-            }
+            m[state] = WideDecision::metric(joined<0, abreast>([&](unsigned j) MORVIK_INLINE_LAMBDA {
+                return Value::load(itsConstituent.betaStart + (windows.r[j] * states + state) * lanesOfSlice +
+                                   windows.v * count);
+            }));
         });
         return m;
     }

@@ -60,45 +60,45 @@ struct Greatest {
     }
 };
 
-/// Looks up the correction of a decision difference.
-template <unsigned count>
-struct Corrections {
-    Machine::Table<count> table;
-
-    MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
-    {
-        const Eighths<count> magnitude = max(difference, Eighths<count>::of(-1) - difference);  // -1 reads as 0
-        return table.at(min(magnitude, Eighths<count>::of(4 * 15)) >> 2);
-    }
-};
-
 /// "MOD#": max-log-MAP with a correction one stage late.
 template <unsigned countOfLanes>
 struct Corrected {
     static constexpr unsigned count = countOfLanes;
-    using Decision = rules::DecideMaxHash<Eighths<count>, Corrections<count>>;
+    using Corrections = Machine::Corrections<count>;
+    using Decision = rules::DecideMaxHash<Eighths<count>, Corrections>;
     static constexpr bool fewRegisters = false;
-    Corrections<count> corrections;
+    Corrections corrections;
 
-    explicit MORVIK_INLINE Corrected(const std::uint8_t* table) : corrections{Machine::Table<count>(table)} {}
+    explicit MORVIK_INLINE Corrected(const std::uint8_t* table) : corrections(table) {}
 
     MORVIK_INLINE Decision decision() const
     {
         return Decision(corrections);
     }
 
+    /// Moves b a step back and returns the step's ratio. The states of a pair share their branch metric, which changes
+    /// neither their difference nor the winner, so the candidates of the backward recursion are reused here, too.
     MORVIK_INLINE Eighths<count> stepBack(const StoredColumn<count>& a,
                                           rules::Column<Decision>& b,
                                           const BranchMetrics<count>& g) const
     {
-        StateMetrics<count> alpha{};
-        StateMetrics<count> beta{};
-        rules::forEach<rules::stateCount>([&](auto state) MORVIK_INLINE_LAMBDA {
-            alpha[state] = a[state];
-            beta[state] = Decision::stored(b[state]);
+        const Decision rule = decision();
+        std::array<typename Decision::Metric, 4> one{};
+        std::array<typename Decision::Metric, 4> zero{};
+        b = rules::backwardStep(rule, b, g, [&](auto pair, const auto& c) MORVIK_INLINE_LAMBDA {
+            const Eighths<count> even = a[2 * pair];
+            const Eighths<count> odd = a[2 * pair + 1];
+            one[pair] = rule.decide(odd + c.one[1].value, even + c.one[0].value);
+            zero[pair] = rule.decide(odd + c.zero[1].value, even + c.zero[0].value);
         });
-        b = rules::backwardStep(decision(), b, g);
-        return rules::logLikelihoodRatio(decision(), alpha, beta, g);
+        return best(rule, one) - best(rule, zero);
+    }
+
+private:
+    static MORVIK_INLINE Eighths<count> best(const Decision& rule,
+                                             const std::array<typename Decision::Metric, 4>& pairs)
+    {
+        return rule.settled(rule.decide(rule.decide(pairs[0], pairs[1]), rule.decide(pairs[2], pairs[3])));
     }
 };
 

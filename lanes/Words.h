@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <cstring>
+#include <utility>
 
 #include "rules/Arithmetic.h"
 
@@ -116,24 +117,40 @@ struct Eighths {
     }
 };
 
+/// Takes lanes of two vectors, counted through both.
+template <unsigned count, int... lanes>
+MORVIK_INLINE Eighths<sizeof...(lanes)> lanesOf(Eighths<count> a,
+                                                Eighths<count> b,
+                                                std::integer_sequence<int, lanes...>)
+{
+    return {__builtin_shufflevector(a.v, b.v, lanes...)};
+}
+
+/// Takes as many lanes of a vector, from `first` on.
+template <int first, unsigned count, int... lanes>
+MORVIK_INLINE Eighths<sizeof...(lanes)> lanesFrom(Eighths<count> a, std::integer_sequence<int, lanes...>)
+{
+    return {__builtin_shufflevector(a.v, a.v, (first + lanes)...)};
+}
+
 /// Concatenates two vectors.
 template <unsigned count>
 MORVIK_INLINE Eighths<2 * count> join(Eighths<count> a, Eighths<count> b)
 {
-    static_assert(count == 8);
-    return {__builtin_shufflevector(a.v, b.v, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15)};
+    return lanesOf(a, b, std::make_integer_sequence<int, static_cast<int>(2 * count)>{});
 }
 
 /// Returns part `index` of a vector, in parts of `count` lanes.
 template <unsigned count, unsigned index, unsigned wide>
 MORVIK_INLINE Eighths<count> part(Eighths<wide> a)
 {
+    static_assert(wide % count == 0);
     if constexpr (count == wide) {
         return a;
     } else {
-        static_assert(count == 8);
-        constexpr int o = index * count;
-        return {__builtin_shufflevector(a.v, a.v, o, o + 1, o + 2, o + 3, o + 4, o + 5, o + 6, o + 7)};
+        constexpr int half = wide / 2;
+        constexpr int first = index * count < wide / 2 ? 0 : half;
+        return part<count, index % (wide / 2 / count)>(lanesFrom<first>(a, std::make_integer_sequence<int, half>{}));
     }
 }
 

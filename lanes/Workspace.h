@@ -40,7 +40,7 @@ struct Workspace {
     unsigned windows;             ///< per segment
     const unsigned* windowStart;  ///< [window + 1] the first step of each window, then `steps`
     Constituent constituent[2];
-    const std::uint8_t* corrections;  ///< [16] corrections, indexed by a quarter of the difference
+    const std::uint8_t* corrections;  ///< [correctionEntries] corrections of decision differences (Bounds.h)
     Permutations before;              ///< [vector] each segment from the segment before it
     Permutations after;               ///< [vector] each segment from the segment after it
     const std::int16_t* firstLanes;   ///< [lane] all ones for each block's first segment, else 0

@@ -97,9 +97,13 @@ struct DecideMaxHash {
     MORVIK_INLINE constexpr Metric decide(Metric c1, Metric c2) const
     {
         const Value difference = subWrap(c1.value, c2.value);
-        const Value winner = maxWrap(c1.value, c2.value);
-        const Value pending = select(difference, c1.pending, c2.pending);
-        return {addWrap(winner, pending), table(difference)};
+        return {select(difference, settled(c1), settled(c2)), table(difference)};
+    }
+
+    /// The same where nothing is pending.
+    MORVIK_INLINE constexpr Metric decide(Value c1, Value c2) const
+    {
+        return {maxWrap(c1, c2), table(subWrap(c1, c2))};
     }
 
     MORVIK_INLINE static constexpr Value stored(Metric m)

@@ -11,7 +11,7 @@ using morvik::simulation_call::Status;
 
 namespace {
 
-/// The engine's table, indexed by a quarter of a difference's magnitude in eighths: its finest resolution (rule 9).
+/// The engine's table at the magnitudes that the lanes tell apart.
 morvik::lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
 {
     morvik::lanes::CorrectionTable table = {};
@@ -20,8 +20,8 @@ morvik::lanes::CorrectionTable correctionTable(const TCalculationEngine& engine)
         return table;
     }
     const unsigned shift = engine.itsStateFormat->itsShift;
-    for (std::size_t quarter = 0; quarter < table.size(); ++quarter) {
-        table[quarter] = static_cast<std::uint8_t>(base->itsAlphaLUT[(4 * quarter) << shift] >> shift);
+    for (std::size_t i = 0; i < table.size(); ++i) {
+        table[i] = static_cast<std::uint8_t>(base->itsAlphaLUT[morvik::lanes::correctionStep * i << shift] >> shift);
     }
     return table;
 }

@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "lanes/Bounds.h"
+#include "rules/Correction.h"
 #include "rules/Trellis.h"
 
 namespace rules = morvik::rules;
@@ -337,6 +338,27 @@ TEST(LaneBounds, OfARatiosDecisions)
 TEST(LaneBounds, OfARatio)
 {
     EXPECT_EQ(overAllSteps(greatestRatio), 944);
+}
+
+/// The entries kept in the lanes, the last of which is 0, are those of all differences that are compared.
+TEST(LaneBounds, OfACorrectedDifference)
+{
+    constexpr std::uint32_t points = 16;
+    constexpr std::uint32_t resolved = rules::resolvedFractionBits(rules::fractionBits, 4);
+    constexpr std::uint32_t ignored = rules::fractionBits + rules::stateAlignment - resolved;
+    constexpr std::int32_t eighth = 1 << rules::stateAlignment;
+    const auto correction = [](std::int32_t difference) {
+        return rules::correction(
+            difference * eighth, ignored, points, rules::stateAlignment, 1U << rules::fractionBits);
+    };
+    constexpr int reach = morvik::lanes::correctionEntries * morvik::lanes::correctionStep;
+    EXPECT_EQ(correction(0), mostCorrection);
+    EXPECT_EQ(correction(reach - morvik::lanes::correctionStep), 0);
+    for (int difference = -wrapsFrom; difference < wrapsFrom; ++difference) {
+        const int within = std::clamp(difference, -reach, reach - 1) >> morvik::lanes::correctionStepBits;
+        const int entry = morvik::lanes::correctionEntry(within);
+        EXPECT_EQ(correction(difference), correction(entry * morvik::lanes::correctionStep)) << difference;
+    }
 }
 
 /// The greatest magnitude of a metric that a recursion starts a window from: as it is given, or brought back
