@@ -15,19 +15,19 @@
 //     ratio = $morvik_ratio(handle, bit);                                     of the last pass
 //     standing = $morvik_report(handle, partial);
 //     $morvik_checker_destroy(handle);
-#include <sv_vpi_user.h>
-#include <vpi_user.h>
-
+//
+// The units of the core are in Units.cpp.
 #include <algorithm>
 #include <array>
 #include <cstddef>
 #include <cstdint>
 #include <map>
 #include <memory>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "Units.h"
+#include "Vpi.h"
 #include "bindings/simulator/Session.h"
 #include "hardware/testbench/Signals.h"
 #include "morvik_checker.h"
@@ -36,6 +36,7 @@
 namespace {
 
 using morvik::simulator::Session;
+using namespace morvik::icarus;
 
 constexpr int tailPositions = morvik::rules::tailPositions;
 
@@ -44,11 +45,6 @@ constexpr int tailPositions = morvik::rules::tailPositions;
 struct Call {
     const char* name;
     const char* arguments;
-};
-
-/// An error in the arguments of a call.
-struct Mistake : std::runtime_error {
-    using std::runtime_error::runtime_error;
 };
 
 std::map<int, std::unique_ptr<Session>>& sessions()
@@ -72,23 +68,6 @@ Checkers& checkers()
     return all;
 }
 
-// The interface takes non-const strings, but does not change them.
-char* text(const char* constant)
-{
-    return const_cast<char*>(constant);
-}
-
-/// In the format of the simulator's own errors.
-void report(const char* severity, const std::string& line)
-{
-    vpiHandle call = vpi_handle(vpiSysTfCall, nullptr);
-    vpi_printf(text("%s: %s:%d: morvik: %s\n"),
-               severity,
-               vpi_get_str(vpiFile, call),
-               static_cast<int>(vpi_get(vpiLineNo, call)),
-               line.c_str());
-}
-
 template <class Next>
 void reportAll(Next next)
 {
@@ -107,55 +86,6 @@ void reportMessages(morvik_checker* checker)
     reportAll([=] { return morvik_checker_message(checker); });
 }
 
-std::vector<vpiHandle> argumentsOf(vpiHandle call)
-{
-    std::vector<vpiHandle> all;
-    vpiHandle iterator = vpi_iterate(vpiArgument, call);
-    if (iterator != nullptr) {
-        while (vpiHandle argument = vpi_scan(iterator)) {
-            all.push_back(argument);
-        }
-    }
-    return all;
-}
-
-/// A value, sign-extended if `isSigned` and narrower than 32 bits. A wider one must fit into 32 bits.
-int valueOf(vpiHandle object, bool isSigned, const std::string& name)
-{
-    const int width = vpi_get(vpiSize, object);
-    s_vpi_value value{};
-    value.format = vpiVectorVal;
-    vpi_get_value(object, &value);
-    const s_vpi_vecval* const words = value.value.vector;
-    const auto bits = static_cast<std::uint32_t>(words[0].aval);
-    const bool isNegative = isSigned && width > 32 && bits >> 31 != 0;
-    for (int i = 0; i * 32 < width; ++i) {
-        if (words[i].bval != 0) {
-            throw Mistake(name + " has bits that are x or z");
-        }
-        const int unused = width - i * 32 < 32 ? 32 - (width - i * 32) : 0;
-        const std::uint32_t extension = isNegative ? ~std::uint32_t{0} >> unused : 0;
-        if (i > 0 && static_cast<std::uint32_t>(words[i].aval) != extension) {
-            throw Mistake(name + " does not fit in 32 bits");
-        }
-    }
-    const std::uint32_t sign = isSigned && width < 32 ? std::uint32_t{1} << (width - 1) : 0;
-    return static_cast<std::int32_t>((bits ^ sign) - sign);
-}
-
-int argument(vpiHandle object, const std::string& name)
-{
-    return valueOf(object, vpi_get(vpiSigned, object) != 0, name);
-}
-
-void setValue(vpiHandle object, int integer)
-{
-    s_vpi_value value{};
-    value.format = vpiIntVal;
-    value.value.integer = integer;
-    vpi_put_value(object, &value, nullptr, vpiNoDelay);
-}
-
 /// As the result of a function.
 void setUnknown(vpiHandle object)
 {
@@ -164,17 +94,6 @@ void setUnknown(vpiHandle object)
     value.format = vpiVectorVal;
     value.value.vector = &bits;
     vpi_put_value(object, &value, nullptr, vpiNoDelay);
-}
-
-bool isConstant(vpiHandle object)
-{
-    const int type = vpi_get(vpiType, object);
-    return type == vpiConstant || type == vpiParameter;
-}
-
-bool isString(vpiHandle object)
-{
-    return isConstant(object) && vpi_get(vpiConstType, object) == vpiStringConst;
 }
 
 /// A signal's number, from its name or as it is.
@@ -445,23 +364,6 @@ constexpr Call ratioCall{"$morvik_ratio", "ii"};
 constexpr Call reportCall{"$morvik_report", "ii"};
 constexpr Call destroyCheckerCall{"$morvik_checker_destroy", "i"};
 
-bool isArray(vpiHandle object)
-{
-    const int type = vpi_get(vpiType, object);
-    return type == vpiMemory || type == vpiNetArray;
-}
-
-/// Reals and strings have no bits to ask for.
-bool isInteger(vpiHandle object)
-{
-    if (isConstant(object)) {
-        const int kind = vpi_get(vpiConstType, object);
-        return kind != vpiRealConst && kind != vpiStringConst;
-    }
-    const int type = vpi_get(vpiType, object);
-    return type != vpiRealVar && type != vpiStringVar;
-}
-
 /// Elements of an array of reals appear to have one bit, like those of hard bits.
 void checkSoftValues(vpiHandle array, const std::string& name)
 {
@@ -506,9 +408,7 @@ PLI_INT32 check(PLI_BYTE8* data)  // NOLINT(readability-non-const-parameter): th
             checkArgument(arguments[i], kinds[std::min(i, kinds.size() - 1)], i + 1);
         }
     } catch (const std::exception& error) {
-        report("ERROR", std::string(call.name) + ": " + error.what());
-        vpip_set_return_value(1);
-        vpi_control(vpiFinish, 1);
+        failCompilation(std::string(call.name) + ": " + error.what());
     }
     return 0;
 }
@@ -557,6 +457,7 @@ void announceAll()
     announce(ratioCall, vpiSysFunc, run<ratio, MORVIK_CHECKER_UNKNOWN, true>);
     announce(reportCall, vpiSysFunc, run<reportBlock, MORVIK_CHECKER_REFUSED, true>);
     announce(destroyCheckerCall, vpiSysTask, run<destroyChecker, 0, false>);
+    announceUnits();
 }
 
 }  // namespace

@@ -20,6 +20,13 @@ module wrong_arguments_tb;
         status = $morvik_decode(1, values, dout, values, 44, 8, 0, dout);
         status = $morvik_decode(1, values, values, values, 44, 8, 0, nets);
         $morvik_destroy(1, 2);
+        status = $morvik_unit_branch(1, dout[0]);
+        status = $morvik_unit_branch(1, 2, dout[0]);
+        status = $morvik_unit_branch(1, values, status);
+        status = $morvik_unit_branch(1, number, status);
+        status = $morvik_unit_branch(1, 2, 3);
+        status = $morvik_unit_extrinsic(values, 2, 3, status);
+        status = $morvik_unit_address(40, 2, nets[0]);
         $display("the simulation has begun");
     end
 endmodule
