@@ -11,6 +11,7 @@
 
 #include "MorvikChecker.h"
 #include "MorvikDecoder.h"
+#include "MorvikUnits.h"
 #include "conformance/Cases.h"
 
 namespace {
@@ -122,6 +123,49 @@ void checkChecker()
     expectAnswer(one.observe(MORVIK_CHECKER_LLR, 0, 0, 0), MORVIK_CHECKER_REFUSED, noBlock);
 }
 
+template <class Row>
+std::string rowText(const Row& row)
+{
+    std::string text;
+    for (const auto value : row) {
+        text += std::to_string(value) + ' ';
+    }
+    return text;
+}
+
+/// Each unit with the values that the tests of all bindings have.
+void checkUnits()
+{
+    const MorvikUnits units(2);
+    MorvikUnits::Column alpha;
+    MorvikUnits::Column beta;
+    for (int i = 0; i < 8; ++i) {
+        const auto state = static_cast<std::size_t>(i);
+        alpha.metrics[state] = 12 * i - 40;
+        beta.metrics[state] = 20 - 9 * i;
+        alpha.pending[state] = beta.pending[state] = i < 5 ? i : 6;
+    }
+    lastReport = "";
+    const auto g = units.branch(units.intrinsic(10, -24), 16);
+    expect("branch", rowText(g), "-3 -35 -35 -3 ");
+    const auto next = units.forward(alpha, g);
+    expect("forward", rowText(next.metrics), "-30 34 47 53 -24 21 61 47 ");
+    expect("pending", rowText(next.pending), "4 0 0 1 1 0 0 4 ");
+    expect("backward", rowText(units.backward(beta, g).metrics), "23 17 16 47 39 7 -7 -1 ");
+    expect("ratio", std::to_string(units.ratio(alpha.metrics, beta.metrics, g)), "-33");
+    expect("extrinsic", std::to_string(units.extrinsic(-101, -19)), "-63");
+    expect("scaled", std::to_string(MorvikUnits(1).extrinsic(-101, -19)), "-48");
+    expect("address", std::to_string(units.address(40, 7)), "31");
+    expect("tail", rowText(units.tail({1, -20, 30}, {-100, 50, -6})), "40 -160 104 -96 -152 48 -8 192 ");
+    expect("border", rowText(units.border(alpha.metrics)), "-40 -32 -16 -8 8 16 32 40 ");
+    expect("no report", lastReport, "");
+    const auto row = MorvikUnits::rowOf<4>(sc_dt::sc_lv<32>("0xfd0102fc"));
+    expect("row", rowText(row), "-4 2 1 -3 ");
+    beta.metrics[5] = 2048;
+    units.backward(beta, g);
+    expect("refused", lastReport, "morvik: ERROR:unit:backward: a metric or the ratio is not from -2048 to 2047");
+}
+
 }  // namespace
 
 int sc_main(int argc, char* argv[])
@@ -172,6 +216,7 @@ int sc_main(int argc, char* argv[])
            "morvik: WARNING:decoder:RSC1 parity value in position 9 saturated positively, further saturation will not "
            "be reported");
     checkChecker();
+    checkUnits();
     std::cout << cases.size() << " blocks, " << failures << " failures\n";
     return failures == 0 ? 0 : 1;
 }

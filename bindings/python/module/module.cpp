@@ -14,6 +14,7 @@
 #include "Link.h"
 #include "Lte.h"
 #include "Simulation.h"
+#include "Units.h"
 #include "rules/Tail.h"
 #include "src/InstructionSetNames.h"
 
@@ -142,6 +143,7 @@ PYBIND11_MODULE(_core, module)
     addLink(module);
     addLte(module);
     addSimulation(module);
+    addUnits(module);
 }
 #undef PyInit__core
 

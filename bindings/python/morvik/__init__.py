@@ -16,7 +16,7 @@ from morvik import _core
 
 _core.expect_main_interpreter()  # an import does not check this again for a module that is already loaded
 
-from morvik import lte
+from morvik import lte, units
 from morvik._checker import Checker
 from morvik._core import __version__
 from morvik._decoder import Decoded, Decoder, instruction_sets
@@ -40,4 +40,5 @@ __all__ = [
     "instruction_sets",
     "interleaver",
     "lte",
+    "units",
 ]

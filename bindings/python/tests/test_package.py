@@ -60,8 +60,9 @@ def test_everything_has_a_docstring():
         value = getattr(morvik, name)
         if inspect.isclass(value) or inspect.isfunction(value):
             assert inspect.getdoc(value), name
-    for name in morvik.lte.__all__:
-        assert inspect.getdoc(getattr(morvik.lte, name)), name
+    for module in (morvik.lte, morvik.units):
+        for name in module.__all__:
+            assert inspect.getdoc(getattr(module, name)), name
     for kind in (morvik.Decoder, morvik.lte.Transport):
         for name, member in inspect.getmembers(kind):
             if not name.startswith("_"):
@@ -70,8 +71,9 @@ def test_everything_has_a_docstring():
 
 def test_example_of_the_docstring():
     assert doctest.testmod(morvik).failed == 0
-    tested = doctest.testmod(morvik.lte)
-    assert tested.failed == 0 and tested.attempted > 0
+    for module in (morvik.lte, morvik.units):
+        tested = doctest.testmod(module)
+        assert tested.failed == 0 and tested.attempted > 0
 
 
 def test_version_is_that_of_the_project(repository):
