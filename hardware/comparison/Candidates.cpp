@@ -5,140 +5,15 @@
 #include <array>
 #include <cstdlib>
 #include <memory>
-#include <optional>
 #include <string>
 
-#include "rules/Arithmetic.h"
+#include "KnownMistakes.h"
 #include "rules/Formats.h"
 #include "rules/Starts.h"
 
 namespace morvik::comparison {
 
 namespace {
-
-/// A mistake and its description.
-struct NamedMistake {
-    Mistake mistake;
-    const char* text;
-    Candidate::Rank rank = Candidate::telling;
-};
-
-constexpr std::array<const char*, 12> countWords = {
-    "no", "one", "two", "three", "four", "five", "six", "seven", "eight", "nine", "ten", "eleven"};
-
-constexpr unsigned lowZeros(unsigned word)
-{
-    unsigned count = 0;
-    while ((word >> count & 1U) == 0) {
-        ++count;
-    }
-    return count;
-}
-
-/// The low bits that rule 11 clears in border metrics. A dump shows those from an eighth on.
-constexpr unsigned borderZeros = lowZeros(static_cast<std::uint16_t>(rules::borderMask));
-static_assert(borderZeros > rules::stateAlignment && borderZeros < countWords.size());
-
-/// A word as "0xFF80".
-std::string hexadecimal(int word)
-{
-    std::string text = "0x";
-    for (int shift = 12; shift >= 0; shift -= 4) {
-        text += "0123456789ABCDEF"[word >> shift & 0xF];
-    }
-    return text;
-}
-
-/// A mistake in the mask, and its description.
-struct MaskMistake {
-    Mistake mistake;
-    std::string text;
-};
-
-/// Border metrics of which another number of low bits is cleared.
-std::vector<MaskMistake> otherZeros()
-{
-    const std::string right = countWords[borderZeros];
-    std::vector<MaskMistake> mistakes = {
-        {{Mistake::borderMask, -1}, "the " + right + " low bits of border metrics are not cleared (rule 11)"}};
-    for (unsigned zeros = rules::stateAlignment + 1; zeros < countWords.size(); ++zeros) {
-        if (zeros != borderZeros) {
-            mistakes.push_back({{Mistake::borderMask, -(1 << (zeros - rules::stateAlignment))},
-                                std::string(countWords[zeros]) + " low bits of border metrics are cleared, not " +
-                                    right + " (rule 11)"});
-        }
-    }
-    return mistakes;
-}
-
-/// Border metrics of which some of the bits are cleared, but not the low ones up to some bit.
-std::vector<MaskMistake> otherMasks()
-{
-    std::vector<MaskMistake> mistakes;
-    for (int cleared = 1; cleared < 1 << (borderZeros - rules::stateAlignment); ++cleared) {
-        if ((cleared & (cleared + 1)) != 0) {
-            mistakes.push_back({{Mistake::borderMask, ~cleared},
-                                "border metrics are ANDed with " +
-                                    hexadecimal(rules::shiftLeftWrap(~cleared, rules::stateAlignment)) + ", not with " +
-                                    hexadecimal(rules::borderMask) + " (rule 11)"});
-        }
-    }
-    return mistakes;
-}
-
-/// Mistakes in handing on border columns, except their mask.
-constexpr std::array<NamedMistake, 7> borderMistakes = {{
-    {Mistake::borderOfThisPass,
-     "border metrics are those of the other pass: this one's for those of the last one over the same code (rules 19 "
-     "and 20)"},
-    {Mistake::borderOfLastPass,
-     "border metrics are those of the other pass: the last one's over the same code for this one's (rule 20)"},
-    {Mistake::borderOfOtherCode, "border metrics are those of the other code's pass (rules 19 and 20)"},
-    {Mistake::borderLate, "border metrics are a pass over the same code late (rules 19 and 20)"},
-    {Mistake::borderOfFirstPass, "border metrics stay those of the first pass over the same code (rules 19 and 20)"},
-    {Mistake::borderUnknown, "start metrics are zeros, as for an unknown state (rule 10)"},
-    {Mistake::tailClipped, "the tail's branch sums are clipped like branch metrics (rule 12: they are not)"},
-}};
-
-/// Mistakes in the operations themselves.
-constexpr std::array<NamedMistake, 34> namedMistakes = {{
-    {Mistake::aprioriMissing, "the extrinsic values of the pass before do not arrive (rule 13)"},
-    {Mistake::aprioriOfPassBefore, "a pass late: extrinsic values are those of the pass before the last (rule 13)"},
-    {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
-    {Mistake::aprioriInverse, "extrinsic values are taken by the inverse of the permutation (rule 15)"},
-    {Mistake::aprioriBefore, "extrinsic values are taken by the interleaver's address for the step before (rule 15)"},
-    {Mistake::aprioriBehind, "extrinsic values are taken by the interleaver's address for the step after (rule 15)"},
-    {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
-    {Mistake::intrinsicWrapped, "the sum is cut to its low eight bits before it is halved (rule 13)"},
-    {Mistake::intrinsicClipped, "the sum is clipped to eight bits before it is halved (rule 13)"},
-    {Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"},
-    {Mistake::parityNegated, "the sign of the parity is flipped (rule 5)"},
-    {Mistake::negationWrapped, "the parity is negated in eight bits, where -128 stays -128 (rule 5)"},
-    {Mistake::doubledWrapped, "twice the intrinsic value is cut to its low eight bits before the sum (rule 5)"},
-    {Mistake::doubledClipped, "twice the intrinsic value is clipped to eight bits before the sum (rule 5)"},
-    {Mistake::unclipped, "saturation is missing: the sum is wider than eight bits (rules 5 and 14)"},
-    {{Mistake::wrappedTo, 8}, "saturation is missing: the sum is cut to its low eight bits (rules 5 and 14)"},
-    {{Mistake::wrappedTo, 7}, "the sum is cut to its low seven bits, not clipped to eight (rules 5 and 14)"},
-    {{Mistake::wrappedTo, 9},
-     "the sum is cut to its low nine bits, not clipped to eight (rules 5 and 14)",
-     Candidate::included},
-    {{Mistake::clippedTo, 6}, "the sum is clipped to six bits, not eight (rules 5 and 14)"},
-    {{Mistake::clippedTo, 7}, "the sum is clipped to seven bits, not eight (rules 5 and 14)"},
-    {{Mistake::clippedTo, 9}, "the sum is clipped to nine bits, not eight (rules 5 and 14)", Candidate::included},
-    {Mistake::clippedSymmetric, "the sum is clipped to -127, not -128 (rules 5 and 14)"},
-    {Mistake::unwrapped, "the wrap is missing: values saturate (rule 2)"},
-    {Mistake::ratioHeld, "the wrap is missing: values stay at the end of the range (rule 2)"},
-    {{Mistake::computedIn, 11}, "values are 11 bits wide, not 12 (rule 2)"},
-    {{Mistake::storedIn, 11}, "values are 11 bits wide, not 12 (rule 2)"},
-    {{Mistake::computedIn, 10}, "values are 10 bits wide, not 12 (rule 2)"},
-    {{Mistake::storedIn, 10}, "values are 10 bits wide, not 12 (rule 2)"},
-    {{Mistake::computedIn, 9}, "values are 9 bits wide, not 12 (rule 2)"},
-    {{Mistake::storedIn, 9}, "values are 9 bits wide, not 12 (rule 2)"},
-    {{Mistake::storedIn, 8}, "values are 8 bits wide, not 12 (rule 2)"},
-    {Mistake::unscaled, "the factor of 0.75 is missing (rule 14)"},
-    {Mistake::uncorrected, "the correction table is missing (rule 7)"},
-    {Mistake::correctedAtOnce, "corrections come a decision early (rule 7)"},
-}};
 
 constexpr int bitsOf(Stage stage)
 {
@@ -173,9 +48,10 @@ public:
 
     const Column& at(const Place& place)
     {
-        if (!itsPlace || itsPlace->pass != place.pass || itsPlace->step != place.step) {
+        if (!itsIsFilled || itsPlace.pass != place.pass || itsPlace.step != place.step) {
             itsColumn = itsReplay.column(place.pass, stageOf(place.signal), place.step, itsMistake);
             itsPlace = place;
+            itsIsFilled = true;
         }
         return itsColumn;
     }
@@ -188,13 +64,15 @@ public:
     Fit fit(const Place& place, int got)
     {
         const bool equal = got == valueAt(place);
-        return equal || at(place).complete ? fitIf(equal) : Fit::unknown;
+        const Sources& sources = at(place).sources;
+        return equal || (sources.complete && !sources.open) ? fitIf(equal) : sources.open ? Fit::open : Fit::unknown;
     }
 
 private:
     const Replay& itsReplay;
     Mistake itsMistake;
-    std::optional<Place> itsPlace;
+    bool itsIsFilled = false;
+    Place itsPlace{};  ///< of the column
     Column itsColumn;
 };
 
@@ -204,45 +82,69 @@ public:
 
     std::vector<Candidate> all(const std::vector<Fault>& faults)
     {
-        addMasks(otherZeros());
-        addMasks(otherMasks());
-        addNamed(borderMistakes, Candidate::borders);
-        addNamed(namedMistakes, Candidate::operation);
-        const int bits = bitsOf(stageOf(faults.front().place.signal));
-        addKeptIn(11);
-        addKeptIn(10);
+        const Stage stage = stageOf(faults.front().place.signal);
+        constexpr std::size_t fewest = 8;  // with fewer, sizes may fit and bits may look stuck by chance
+        const bool isFitting = faults.size() >= fewest;
+        addAll(knownMistakes(itsModel, stage));
+        if (isFitting) {
+            addAll(fittedMistakes(itsModel, stage));
+        }
+        if (stage == Stage::forward || stage == Stage::backward) {
+            addFittedMask(faults);
+            for (const int bits : {11, 10, 9, 8}) {
+                addKeptIn(bits);
+            }
+        }
         addOtherPlaces();
         addRounding(faults);
         addRelations();
-        constexpr std::size_t fewest = 8;  // with fewer, bits may look stuck by chance
-        if (faults.size() >= fewest) {
+        const int bits = bitsOf(stage);
+        if (isFitting) {
             addStuckBits(bits);
+            addStuckBitsTogether(bits, faults);
+            addStuckWord(faults.front().got);
+        }
+        if (stage == Stage::intrinsic) {
+            addStuckApriori(faults);
         }
         addFlippedBits(bits);
         return std::move(itsCandidates);
     }
 
 private:
-    void addMistake(Mistake mistake, const std::string& text, Candidate::Rank rank, Candidate::Reach reach)
+    void addAll(const std::vector<KnownMistake>& mistakes)
     {
-        const auto columns = std::make_shared<Columns>(itsReplay, mistake);
-        itsCandidates.push_back({text, rank, reach, [columns](const Sample& sample) {
-                                     return columns->fit(sample.place, sample.got);
-                                 }});
-    }
-
-    template <class Mistakes>
-    void addNamed(const Mistakes& mistakes, Candidate::Reach reach)
-    {
-        for (const NamedMistake& each : mistakes) {
-            addMistake(each.mistake, each.text, each.rank, reach);
+        for (const KnownMistake& each : mistakes) {
+            add(each);
         }
     }
 
-    void addMasks(const std::vector<MaskMistake>& mistakes)
+    void add(const KnownMistake& known)
     {
-        for (const MaskMistake& each : mistakes) {
-            addMistake(each.mistake, each.text, Candidate::telling, Candidate::borders);
+        const auto columns = std::make_shared<Columns>(itsReplay, known.mistake);
+        itsCandidates.push_back({known.text,
+                                 known.rank,
+                                 known.reach,
+                                 [columns](const Sample& sample) { return columns->fit(sample.place, sample.got); },
+                                 known.family,
+                                 known.detail});
+    }
+
+    /// A mask keeps the bits that a wrong border column has, and clears those that it lacks. Of other bits, nothing is
+    /// known.
+    void addFittedMask(const std::vector<Fault>& faults)
+    {
+        Columns unmasked(itsReplay, Mistake(Mistake::borderMask, -1));
+        int kept = 0;
+        int cleared = 0;
+        for (const Fault& fault : faults) {
+            kept |= fault.got;
+            cleared |= unmasked.valueAt(fault.place) & ~fault.got;
+        }
+        const int right = rules::shiftRight(rules::borderMask, rules::stateAlignment);
+        const int mask = signExtended(kept | (right & ~cleared), int{rules::stateBits});
+        if (mask != 0) {
+            add(otherMask(mask));
         }
     }
 
@@ -356,6 +258,85 @@ private:
             addRelation(text + '0',
                         [bits, bit](int got, int wanted) { return got == signExtended(wanted & ~(1 << bit), bits); });
         }
+    }
+
+    /// Several bits that are lost or set in most of the faults where they should not be.
+    void addStuckBitsTogether(int bits, const std::vector<Fault>& faults)
+    {
+        const auto isMost = [](std::size_t part, std::size_t rest) {
+            return part > 9 * rest;
+        };
+        std::array<std::vector<int>, 2> stuck;
+        for (int bit = 0; bit < bits; ++bit) {
+            std::array<std::array<std::size_t, 2>, 2> counts{};  // [wanted][got]
+            for (const Fault& fault : faults) {
+                ++counts[static_cast<unsigned>(fault.wanted >> bit) & 1U][static_cast<unsigned>(fault.got >> bit) & 1U];
+            }
+            if (isMost(counts[1][0], counts[1][1]) && isMost(counts[0][0], counts[0][1])) {
+                stuck[0].push_back(bit);
+            } else if (isMost(counts[0][1], counts[0][0]) && isMost(counts[1][1], counts[1][0])) {
+                stuck[1].push_back(bit);
+            }
+        }
+        const std::size_t count = stuck[0].size() + stuck[1].size();
+        if (count < 2 || count == static_cast<std::size_t>(bits)) {
+            return;  // known as a bit or a word
+        }
+        const int low = wordOf(stuck[0]);
+        const int high = wordOf(stuck[1]);
+        const std::string atLow = stuck[0].empty() ? "" : wordsOf(stuck[0]) + " stuck at 0";
+        const std::string atHigh = stuck[1].empty() ? "" : wordsOf(stuck[1]) + " stuck at 1";
+        addRelation(
+            atLow + (atLow.empty() || atHigh.empty() ? "" : ", ") + atHigh,
+            [bits, low, high](int got, int wanted) { return got == signExtended((wanted & ~low) | high, bits); });
+    }
+
+    static int wordOf(const std::vector<int>& bits)
+    {
+        int word = 0;
+        for (const int bit : bits) {
+            word |= 1 << bit;
+        }
+        return word;
+    }
+
+    /// "bit 3 is", "bits 0, 1 and 4 are"
+    static std::string wordsOf(const std::vector<int>& bits)
+    {
+        std::string text = (bits.size() == 1 ? "bit " : "bits ") + std::to_string(bits.front());
+        for (std::size_t i = 1; i < bits.size(); ++i) {
+            text += (i + 1 == bits.size() ? " and " : ", ") + std::to_string(bits[i]);
+        }
+        return text + (bits.size() == 1 ? " is" : " are");
+    }
+
+    /// Cells of the extrinsic values' memory that read as zeros. A single one may hold any value.
+    void addStuckApriori(const std::vector<Fault>& faults)
+    {
+        const auto add = [this](Mistake mistake, const std::string& text) {
+            this->add({mistake, text, Candidate::place, Candidate::included});
+        };
+        add(Mistake::aprioriMissing, "extrinsic values read as zeros (rule 13)");
+        const auto address = extrinsicAddress(itsModel, faults.front().place);
+        if (!address || std::any_of(faults.begin(), faults.end(), [&](const Fault& fault) {
+                return extrinsicAddress(itsModel, fault.place) != address;
+            })) {
+            return;
+        }
+        for (int value = rules::smallestOf(rules::branchBits); value <= rules::largestOf(rules::branchBits); ++value) {
+            if (value != 0) {
+                add({Mistake::aprioriStuck, value}, "extrinsic values read as " + std::to_string(value) + " (rule 13)");
+            }
+        }
+    }
+
+    /// A cell of a memory that is never written, or a register that is held.
+    void addStuckWord(int word)
+    {
+        if (word == 0) {
+            return;  // known as zeros
+        }
+        addRelation("values stay at " + std::to_string(word), [word](int got, int) { return got == word; });
     }
 
     void addFlippedBits(int bits)

@@ -13,8 +13,9 @@
 
 namespace morvik::comparison {
 
-/// Whether a value of the dump is what a mistake gives; unknown if that depends on values that the dump lacks.
-enum class Fit : std::uint8_t { no, yes, unknown };
+/// Whether a value of the dump is what a mistake gives. Unknown if that depends on values that the dump lacks; open if
+/// cores with the mistake may differ there.
+enum class Fit : std::uint8_t { no, yes, unknown, open };
 
 /// A value of the dump and the expected one; equal if the value is right.
 using Sample = Fault;
@@ -24,14 +25,18 @@ struct Candidate {
     /// Among equally good fits, the lowest rank wins: `telling` says how an operation goes wrong, `included` is covered
     /// by one of these, `descriptive` only describes values.
     enum Rank : std::uint8_t { telling, included, descriptive };
-    /// Where the mistake would show: in the wrong borders, in the whole operation or, if it is known by its effect
-    /// alone, in the place that the faults share.
-    enum Reach : std::uint8_t { borders, operation, place };
+    /// Where the mistake would show: in the wrong borders, in the whole operation, in all operations or, if it is known
+    /// by its effect alone, in the place that the faults share.
+    enum Reach : std::uint8_t { borders, operation, core, place };
 
     std::string text;
     Rank rank;
     Reach reach;
     std::function<Fit(const Sample&)> fits;
+    /// Candidates of one family, other than 0, differ in a number alone. Among equally good ones, those with the least
+    /// detail win: a factor of 0.5 needs no 33/64.
+    unsigned family = 0;
+    unsigned detail = 0;
 };
 
 /// All candidates for the faults of a stage. The arguments must outlive them.

@@ -62,7 +62,7 @@ private:
             itsResult.signals[place.signal].missing += itsDump.at(place) == Values::missing ? 1U : 0U;
             if (counts(place)) {
                 follows = follows ? follows : itsReplay.column(pass, stage, step);
-                compareValue(place, follows->values[i], follows->complete);
+                compareValue(place, follows->values[i], follows->sources.complete);
             }
         }
     }

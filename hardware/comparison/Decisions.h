@@ -41,6 +41,39 @@ constexpr Held maxWrap(Held c1, Held c2)
     return c1.value < c2.value ? c2 : c1;
 }
 
+/// A metric in a tree of decisions, one of which takes the lesser candidate.
+struct Leaf {
+    std::int16_t value = 0;
+    unsigned states = 0;    ///< those whose branches it comes from, a bit for each
+    unsigned reversed = 0;  ///< those between which the lesser is taken; 0 where no metric has states: always
+};
+
+constexpr Leaf joined(std::int16_t value, Leaf a, Leaf b)
+{
+    return {value, a.states | b.states, a.reversed | b.reversed};
+}
+
+constexpr Leaf addWrap(Leaf a, Leaf b)
+{
+    return joined(rules::addWrap(a.value, b.value), a, b);
+}
+
+constexpr Leaf subWrap(Leaf a, Leaf b)
+{
+    return joined(rules::subWrap(a.value, b.value), a, b);
+}
+
+constexpr Leaf select(Leaf difference, Leaf c1, Leaf c2)
+{
+    const bool isReversed = difference.states == difference.reversed;
+    return (difference.value < 0) != isReversed ? c2 : c1;
+}
+
+constexpr Leaf maxWrap(Leaf c1, Leaf c2)
+{
+    return joined(select(subWrap(c1, c2), c1, c2).value, c1, c2);
+}
+
 /// Convert between a value type and aligned words.
 template <class Value>
 Value fromWord(std::int16_t word)
@@ -54,6 +87,11 @@ constexpr std::int16_t wordOf(std::int16_t value)
 }
 
 constexpr std::int16_t wordOf(Held value)
+{
+    return value.value;
+}
+
+constexpr std::int16_t wordOf(Leaf value)
 {
     return value.value;
 }

@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <optional>
 #include <ostream>
 #include <vector>
 
@@ -34,6 +35,14 @@ struct Model {
     rules::Cut cut;
     std::array<Code, 2> codes;
 };
+
+/// The address of the extrinsic value that an intrinsic value takes: the step of the pass before; nothing if there is
+/// none.
+inline std::optional<unsigned> extrinsicAddress(const Model& model, const Place& place)
+{
+    const bool hasOne = stageOf(place.signal) == Stage::intrinsic && place.pass > 0 && place.step < model.cut.K();
+    return hasOne ? std::optional(model.codes[codeOf(place.pass)].order[place.step]) : std::nullopt;
+}
 
 /// Decodes the block; the library's warnings go to `warnings`. Throws Refusal if the library refuses.
 Model computeModel(const SoftBlock& block,

@@ -25,9 +25,13 @@ constexpr std::size_t telling = 4;
 /// Larger sets of faults are sampled.
 constexpr std::size_t mostExplained = 20000;
 
-std::vector<Fault> sampleOf(const std::vector<Fault>& faults)
+/// Before all faults, a candidate is tried on so many, of which it may leave twice as many as of all.
+constexpr std::size_t probed = 100;
+constexpr double enoughOfProbe = 0.8;
+
+std::vector<Fault> sampleOf(const std::vector<Fault>& faults, std::size_t most)
 {
-    const std::size_t each = faults.size() / mostExplained + 1;
+    const std::size_t each = faults.size() / most + 1;
     std::vector<Fault> some;
     // Not in equal strides: those may hit only one signal or one segment.
     std::minstd_rand random;
@@ -54,7 +58,7 @@ public:
         finding.faults = faults.size();
         finding.where = where.text();
         finding.isByChance = distinct(faults) < telling;
-        const std::vector<Fault> some = sampleOf(faults);
+        const std::vector<Fault> some = sampleOf(faults, mostExplained);
         explainByCandidates(where, some, finding);
         if (finding.how.empty()) {
             describe(some, finding);
@@ -108,28 +112,32 @@ private:
             itsColumn = itsReplay.column(place.pass, stage, place.step);
             itsPlace = place;
         }
-        return {itsColumn.values[place.signal - signalsOf(stage).first], itsColumn.complete};
+        return {itsColumn.values[place.signal - signalsOf(stage).first], itsColumn.sources.complete};
     }
 
     /// The right values of a stage; only those of the first differing pass if the dump lacks inputs.
-    std::vector<Sample> rightValues(Stage stage)
+    const std::vector<Sample>& rightValues(Stage stage)
     {
+        std::optional<std::vector<Sample>>& right = itsRight[static_cast<std::size_t>(stage)];
+        if (right) {
+            return *right;
+        }
+        right.emplace();
         const bool known = itsComparison.inputsAreKnown;
         const unsigned firstPass = known ? 0 : itsComparison.first->pass;
         const unsigned endPass = known ? itsDump.passes() : firstPass + 1;
-        std::vector<Sample> right;
         const auto [first, count] = signalsOf(stage);
         for (unsigned pass = firstPass; pass < endPass; ++pass) {
             for (unsigned step = 0; step < itsDump.steps(); ++step) {
                 for (unsigned signal = first; signal < first + count; ++signal) {
                     const Place place = {pass, signal, step};
                     if (itsDump.has(place) && itsModel.values.has(place) && isRight(place)) {
-                        right.push_back({place, itsDump.at(place), itsDump.at(place)});
+                        right->push_back({place, itsDump.at(place), itsDump.at(place)});
                     }
                 }
             }
         }
-        return right;
+        return *right;
     }
 
     bool isRight(const Place& place)
@@ -138,31 +146,40 @@ private:
         return (wanted.complete || !itsComparison.inputsAreKnown) && wanted.value == itsDump.at(place);
     }
 
-    /// The fraction of the faults that the candidate explains; 0 if below `enough`.
-    static double explainedBy(const Candidate& candidate, const std::vector<Fault>& faults)
+    /// The fraction of the faults that the candidate explains; 0 if it contradicts more than it may, or says nothing of
+    /// half of them.
+    static double explainedBy(const Candidate& candidate, const std::vector<Fault>& faults, double fraction = enough)
     {
         const double all = static_cast<double>(faults.size());
         std::size_t missed = 0;
+        std::size_t open = 0;
         for (const Fault& fault : faults) {
-            missed += candidate.fits(fault) == Fit::yes ? 0U : 1U;
-            if (static_cast<double>(missed) > (1 - enough) * all) {
+            const Fit fit = candidate.fits(fault);
+            missed += fit == Fit::no || fit == Fit::unknown ? 1U : 0U;
+            open += fit == Fit::open ? 1U : 0U;
+            if (static_cast<double>(missed) > (1 - fraction) * all || static_cast<double>(2 * open) > all) {
                 return 0;
             }
         }
-        return (all - static_cast<double>(missed)) / all;
+        return (all - static_cast<double>(missed + open)) / all;
     }
 
     /// How far a mistake may reach without contradicting a right value.
     enum class Reach : std::uint8_t { nowhere, limited, everywhere };
 
-    static Reach reachOf(const Candidate& candidate, const Where& where, const std::vector<Sample>& right)
+    Reach reachOf(const Candidate& candidate, const Where& where, Stage stage)
     {
+        if (candidate.reach == Candidate::core) {
+            return std::none_of(stages.begin(), stages.end(), [&](Stage each) { return contradicts(candidate, each); })
+                       ? Reach::everywhere
+                       : Reach::nowhere;
+        }
         const Where limited = candidate.reach == Candidate::borders     ? where.ofBorders()
                               : candidate.reach == Candidate::operation ? where.ofOperation()
                                                                         : where;
         const Where everywhere = limited.spread();
         auto reach = Reach::everywhere;
-        for (const Sample& sample : right) {
+        for (const Sample& sample : rightValues(stage)) {
             if (everywhere.contains(sample.place) && candidate.fits(sample) == Fit::no) {
                 if (limited.contains(sample.place)) {
                     return Reach::nowhere;
@@ -173,36 +190,56 @@ private:
         return reach;
     }
 
+    /// Whether a right value of the stage would be another under the mistake.
+    bool contradicts(const Candidate& candidate, Stage stage)
+    {
+        const std::vector<Sample>& right = rightValues(stage);
+        return std::any_of(
+            right.begin(), right.end(), [&](const Sample& sample) { return candidate.fits(sample) == Fit::no; });
+    }
+
     void explainByCandidates(const Where& where, const std::vector<Fault>& faults, Finding& finding)
     {
-        std::optional<std::vector<Sample>> right;
+        const std::vector<Fault> some = sampleOf(faults, probed);
+        std::vector<Candidate> best;
         auto rank = Candidate::descriptive;
         for (const Candidate& each : candidates(itsModel, itsReplay, faults)) {
-            const double part = explainedBy(each, faults);
+            const double part = explainedBy(each, some, enoughOfProbe) > 0 ? explainedBy(each, faults) : 0;
             const bool isBetter = part > finding.explained || each.rank < rank;
             if (part <= 0 || part < finding.explained || (!isBetter && each.rank > rank)) {
                 continue;
             }
-            if (!right) {
-                right = rightValues(finding.stage);
-            }
-            const Reach reach = reachOf(each, where, *right);
+            const Reach reach = reachOf(each, where, finding.stage);
             if (reach == Reach::nowhere) {
                 continue;
             }
             if (isBetter) {
-                finding.how.clear();
+                best.clear();
             }
             finding.explained = part;
             rank = each.rank;
-            if (std::find(finding.how.begin(), finding.how.end(), each.text) == finding.how.end()) {
-                finding.how.push_back(each.text);
-            }
+            best.push_back(each);
             if (each.reach != Candidate::place && faults.size() > 1) {
                 const Where shown = where.ofBorders();
                 finding.where = (reach == Reach::everywhere ? shown.spread() : shown).text();
             }
         }
+        finding.how = simplestOf(best);
+    }
+
+    /// The texts of the candidates but those of a family that say the same in more detail.
+    static std::vector<std::string> simplestOf(const std::vector<Candidate>& candidates)
+    {
+        std::vector<std::string> texts;
+        for (const Candidate& each : candidates) {
+            const bool isSimplest = std::none_of(candidates.begin(), candidates.end(), [&](const Candidate& other) {
+                return each.family != 0 && other.family == each.family && other.detail < each.detail;
+            });
+            if (isSimplest && std::find(texts.begin(), texts.end(), each.text) == texts.end()) {
+                texts.push_back(each.text);
+            }
+        }
+        return texts;
     }
 
     /// Describes what holds for the wrong values, but would not for right ones.
@@ -236,6 +273,7 @@ private:
     Replay itsReplay;
     std::optional<Place> itsPlace;  ///< of the column
     Column itsColumn;
+    std::array<std::optional<std::vector<Sample>>, stages.size()> itsRight;  ///< right values, once they are asked for
 };
 
 /// How many values of the dump equal the model's once its numbers are shifted, of those that are right unshifted and of
@@ -289,6 +327,26 @@ constexpr std::array<Shift, 4> shifts = {{
      "say so"},
 }};
 
+/// One cause of all findings is likelier than several that explain as much.
+void keepSharedCauses(std::vector<Finding>& findings)
+{
+    if (findings.empty()) {
+        return;
+    }
+    std::vector<std::string> shared = findings.front().how;
+    for (const Finding& each : findings) {
+        shared.erase(std::remove_if(shared.begin(),
+                                    shared.end(),
+                                    [&](const std::string& how) {
+                                        return std::find(each.how.begin(), each.how.end(), how) == each.how.end();
+                                    }),
+                     shared.end());
+    }
+    for (Finding& each : findings) {
+        each.how = shared.empty() ? each.how : shared;
+    }
+}
+
 }  // namespace
 
 std::vector<Finding> findPatterns(const Model& model, const Values& dump, const Comparison& comparison)
@@ -302,6 +360,7 @@ std::vector<Finding> findPatterns(const Model& model, const Values& dump, const 
             findings.push_back(explainer.explain(stage));
         }
     }
+    keepSharedCauses(findings);
     return findings;
 }
 

@@ -7,70 +7,22 @@
 #include <optional>
 #include <vector>
 
+#include "Mistake.h"
 #include "Model.h"
 #include "Values.h"
 
 namespace morvik::comparison {
 
-/// A mistake in an operation, which makes it give other values than the core's.
-struct Mistake {
-    enum Kind : std::uint8_t {
-        none,
-        aprioriMissing,       ///< intrinsic values from the systematic ones alone
-        aprioriOfPassBefore,  ///< extrinsic values of the pass before the last one
-        aprioriUnpermuted,    ///< extrinsic values in the order of the other code
-        aprioriInverse,       ///< by the inverse permutation
-        aprioriBefore,        ///< by the interleaver's address for the step before
-        aprioriBehind,
-        systematicUnpermuted,  ///< systematic values in the natural order, on the interleaved code
-        intrinsicWrapped,      ///< the sum cut to eight bits before it is halved
-        intrinsicClipped,      ///< the sum clipped to eight bits before it is halved
-        parityOfOtherCode,
-        parityNegated,
-        negationWrapped,    ///< the parity negated in eight bits, where -128 stays -128
-        doubledWrapped,     ///< twice the intrinsic value cut to eight bits
-        doubledClipped,     ///< twice the intrinsic value clipped to eight bits
-        unclipped,          ///< branch metrics and extrinsic values wider than eight bits
-        clippedTo,          ///< `number` bits
-        clippedSymmetric,   ///< to -127 and 127
-        wrappedTo,          ///< their low `number` bits
-        unwrapped,          ///< metrics and ratios saturate
-        ratioHeld,          ///< only the last difference of the ratio saturates
-        storedIn,           ///< metrics and ratios cut to `number` bits once decided
-        computedIn,         ///< in registers and adders of `number` bits
-        borderMask,         ///< border columns ANDed with `number`, in eighths
-        borderUnknown,      ///< border columns of zeros
-        borderOfThisPass,   ///< instead of the last pass's
-        borderOfLastPass,   ///< instead of this pass's
-        borderOfOtherCode,  ///< of the pass before, over the other code
-        borderLate,         ///< those for the last pass over the code
-        borderOfFirstPass,  ///< over the code, never updated
-        tailClipped,        ///< the branch sums of the tail clipped like branch metrics
-        unscaled,           ///< extrinsic values not multiplied by 0.75
-        uncorrected,        ///< decisions without the correction table
-        correctedAtOnce,    ///< corrections added to their own decision, not to the next
-    };
-
-    constexpr Mistake(Kind what = none, int size = 0) : kind(what), number(size) {}
-
-    friend constexpr bool operator==(const Mistake& mistake, Kind asked)
-    {
-        return mistake.kind == asked;
-    }
-
-    friend constexpr bool operator!=(const Mistake& mistake, Kind asked)
-    {
-        return mistake.kind != asked;
-    }
-
-    Kind kind;
-    int number;
+/// Where the inputs of an operation come from.
+struct Sources {
+    bool complete = true;  ///< whether all inputs are in the dump
+    bool open = false;     ///< whether the mistake leaves open what an input is, as beyond the end of a memory
 };
 
 /// The result of an operation, in eighths.
 struct Column {
     std::array<std::int16_t, 8> values = {};  ///< of the stage's signals
-    bool complete = true;                     ///< whether all inputs are in the dump
+    Sources sources;
 };
 
 /// Repeats operations on inputs from the dump, or from the model if the dump lacks them. A value that merely follows
@@ -91,35 +43,64 @@ private:
     using Metrics = std::array<std::int16_t, 8>;  // aligned words
     using Branches = std::array<std::int16_t, 4>;
 
-    std::int16_t input(const Place& place, bool& complete) const;
+    std::int16_t input(const Place& place, Sources& sources) const;
     template <class Aligned>
-    Aligned inputs(unsigned pass, Stage stage, unsigned trellisStep, bool& complete) const;
+    Aligned inputs(unsigned pass, Stage stage, unsigned trellisStep, Sources& sources) const;
+    Metrics metrics(unsigned pass, Stage stage, unsigned trellisStep, Sources& sources) const;
+    Branches branches(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+    const Code& codeUsed(unsigned pass, Mistake mistake) const;
+    /// The step from whose address a value is read, if the mistake is that it is misread.
+    unsigned addressed(unsigned trellisStep, Mistake mistake, Mistake::Kind misread, Sources& sources) const;
 
     /// The step of the previous pass whose extrinsic value a step takes.
-    unsigned aprioriStep(unsigned code, unsigned trellisStep, Mistake mistake) const;
-    int twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, bool& complete) const;
+    unsigned aprioriStep(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+    int aprioriValue(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+    int systematicValue(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+    int twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
 
     struct TwiceIntrinsic {
         int value;
         bool isSure;  ///< whether the bit below an eighth, which dumps lack, follows from the dump's own values
     };
 
-    TwiceIntrinsic twiceIntrinsic(unsigned pass, unsigned trellisStep, bool& complete) const;
+    TwiceIntrinsic twiceIntrinsic(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
     bool isInDump(unsigned pass, Stage stage, unsigned trellisStep, const Column& column) const;
-    /// Applies `compute` to twice an intrinsic value. If that is not sure, tries both values and takes the one that
-    /// gives what the dump has, if either does.
+    /// Applies `compute` to twice an intrinsic value, as the mistake has it. If that is not sure, tries both values and
+    /// takes the one that gives what the dump has, if either does.
     template <class Compute>
-    Column fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisStep, Compute compute) const;
-    bool givesWhatFollows(unsigned pass, unsigned trellisStep, int twice) const;
-    /// 3x / 4 or x, not yet narrowed to eight bits (rule 14).
+    Column fromTwiceIntrinsic(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake, Compute compute) const;
+    bool givesWhatFollows(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const;
+    /// The scaled difference of ratio and intrinsic value, not yet narrowed to eight bits (rule 14).
     int wideExtrinsicValue(int ratio, int twice, Mistake mistake) const;
     int extrinsicValue(int ratio, int twice, Mistake mistake) const;
-    Branches branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake) const;
+    Branches branchMetrics(unsigned pass, unsigned trellisStep, int twice, Mistake mistake, Sources& sources) const;
+    /// The branch metrics that the ratio of a step takes.
+    Branches branchesOfRatio(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+
+    /// What a step of a recursion takes, of it and of the step before it, whose decisions may have left corrections
+    /// pending.
+    struct StepInputs {
+        bool isForward;
+        Metrics metrics;
+        Branches branches;
+        bool hasEarlier;
+        Metrics earlierMetrics;
+        Branches earlierBranches;
+    };
+
+    Metrics stepped(const StepInputs& from, Mistake mistake) const;
     /// The column that a recursion reaches from the step `from`. `hasEarlier` tells whether it came there from another
-    /// step, whose decisions may have left corrections pending.
-    Metrics reached(unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, bool& complete) const;
-    Metrics forwardStart(unsigned pass, unsigned segment, Mistake mistake, bool& complete) const;
-    Metrics backwardStart(unsigned pass, const rules::Window& window, Mistake mistake, bool& complete) const;
+    /// step.
+    Metrics reached(
+        unsigned pass, Stage stage, unsigned from, bool hasEarlier, Mistake mistake, Sources& sources) const;
+
+    Metrics forwardStart(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+    Metrics backwardStart(
+        unsigned pass, const rules::Window& window, unsigned trellisStep, Mistake mistake, Sources& sources) const;
+    /// The step from which a recursion reaches the border column that another one starts from.
+    unsigned borderSource(bool isForward, unsigned from, Mistake mistake, Sources& sources) const;
+    /// Systematic and parity value of each step of the tail in turn.
+    std::array<int, 6> tailValues(unsigned pass, Mistake mistake) const;
     Metrics tail(unsigned pass, Mistake mistake) const;
     /// The pass whose column a segment or window starts from; nothing if the state is unknown.
     static std::optional<unsigned> borderPass(unsigned pass, bool ofThisPass, Mistake mistake);

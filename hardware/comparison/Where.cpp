@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <set>
 
 namespace morvik::comparison {
 
@@ -66,6 +67,47 @@ std::optional<unsigned> common(const std::vector<Fault>& faults, Property proper
     return all ? std::optional<unsigned>(first) : std::nullopt;
 }
 
+std::optional<unsigned> addressOf(const Model& model, const Place& place, bool isOfExtrinsic)
+{
+    return isOfExtrinsic                ? extrinsicAddress(model, place)
+           : place.step < model.cut.K() ? std::optional(place.step)
+                                        : std::nullopt;
+}
+
+/// The bits that all addresses share; none if a fault has no address, or if there are too few to tell.
+std::optional<SharedAddress> sharedBits(const Model& model, const std::vector<Fault>& faults, bool isOfExtrinsic)
+{
+    const auto first = addressOf(model, faults.front().place, isOfExtrinsic);
+    unsigned differing = 0;
+    std::set<unsigned> addresses;
+    for (const Fault& fault : faults) {
+        const auto address = addressOf(model, fault.place, isOfExtrinsic);
+        if (!first || !address) {
+            return std::nullopt;
+        }
+        differing |= *address ^ *first;
+        addresses.insert(*address);
+    }
+    constexpr std::size_t fewestAtOne = 4;
+    if (differing == 0) {
+        const bool isTelling = faults.size() >= fewestAtOne;
+        return isTelling ? std::optional(SharedAddress{isOfExtrinsic, ~0U, *first}) : std::nullopt;
+    }
+    constexpr std::size_t fewestSharing = 16;  // fewer may have a bit in common by chance
+    for (unsigned bit = 1; addresses.size() >= fewestSharing && bit < model.cut.K(); bit *= 2) {
+        if ((differing & bit) == 0) {
+            return SharedAddress{isOfExtrinsic, bit, *first & bit};
+        }
+    }
+    return std::nullopt;
+}
+
+std::optional<SharedAddress> sharedAddress(const Model& model, const std::vector<Fault>& faults)
+{
+    const auto steps = sharedBits(model, faults, false);
+    return steps ? steps : sharedBits(model, faults, true);
+}
+
 void append(std::string& text, const std::string& part)
 {
     text += (text.empty() || part.empty() ? "" : ", ") + part;
@@ -99,7 +141,12 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
         itsUnit.reset();
     }
     constexpr std::size_t fewestSpread = 8;  // fewer may be close together by chance
-    itsHasRange = itsKind == nullptr && faults.size() >= fewestSpread && 2 * (itsLast - itsFirst + 1) <= stepsAround();
+    constexpr std::size_t fewestAtOne = 3;   // in several passes or signals
+    itsHasRange = itsKind == nullptr && faults.size() >= (itsFirst == itsLast ? fewestAtOne : fewestSpread) &&
+                  2 * (itsLast - itsFirst + 1) <= stepsAround();
+    if (itsKind == nullptr && !itsHasRange && !itsSegment && !itsUnit) {
+        itsAddress = sharedAddress(model, faults);
+    }
     const auto [first, count] = signalsOf(itsStage);
     const auto inDump = std::count_if(comparison.signals.begin() + first,
                                       comparison.signals.begin() + first + count,
@@ -125,8 +172,20 @@ bool Where::contains(const Place& place) const
     if ((itsHasRange || itsIsOnePlace) && (place.step < itsFirst || place.step > itsLast)) {
         return false;
     }
+    if (!hasAddress(place)) {
+        return false;
+    }
     const rules::StepPlace where = itsModel->cut.placeOf(place.step);
     return (!itsSegment || *itsSegment == where.segment) && (!itsUnit || *itsUnit == where.unit);
+}
+
+bool Where::hasAddress(const Place& place) const
+{
+    if (!itsAddress) {
+        return true;
+    }
+    const auto address = addressOf(*itsModel, place, itsAddress->isOfExtrinsic);
+    return address && (*address & itsAddress->mask) == itsAddress->bits;
 }
 
 Where Where::ofBorders() const
@@ -134,6 +193,7 @@ Where Where::ofBorders() const
     Where wide = itsIsOnePlace ? spread() : *this;
     wide.itsSignals.set();
     wide.itsHasRange = false;
+    wide.itsAddress.reset();
     return wide;
 }
 
@@ -166,6 +226,7 @@ std::string Where::text() const
     append(text, passText());
     append(text, signalText());
     append(text, stepText());
+    append(text, addressText());
     return text;
 }
 
@@ -194,6 +255,22 @@ std::string Where::signalText() const
         }
     }
     return text + " alone";
+}
+
+std::string Where::addressText() const
+{
+    if (!itsAddress) {
+        return "";
+    }
+    if (itsAddress->mask == ~0U) {
+        return "at address " + std::to_string(itsAddress->bits) + " of the extrinsic values alone";
+    }
+    unsigned bit = 0;
+    while (itsAddress->mask >> bit != 1) {
+        ++bit;
+    }
+    return (itsAddress->isOfExtrinsic ? "at addresses of extrinsic values whose bit " : "at steps whose bit ") +
+           std::to_string(bit) + " is " + (itsAddress->bits != 0 ? "1" : "0") + " alone";
 }
 
 std::string Where::stepText() const

@@ -19,6 +19,14 @@ struct PlaceKind {
     bool (*matches)(const rules::Cut&, const Place&);
 };
 
+/// What the addresses of faults share: some bits. An address is a trellis step or, of intrinsic values, that of the
+/// extrinsic value.
+struct SharedAddress {
+    bool isOfExtrinsic;
+    unsigned mask;
+    unsigned bits;
+};
+
 /// A set of places of one stage.
 class Where {
 public:
@@ -45,6 +53,8 @@ private:
     std::string passText() const;
     std::string signalText() const;
     std::string stepText() const;
+    std::string addressText() const;
+    bool hasAddress(const Place& place) const;
 
     const Model* itsModel;
     Stage itsStage;
@@ -58,6 +68,7 @@ private:
     unsigned itsFirst = 0;  ///< step
     unsigned itsLast = 0;
     bool itsHasRange = false;  ///< whether only the steps from first to last belong to it
+    std::optional<SharedAddress> itsAddress;
     bool itsIsOnePlace = false;
 };
 

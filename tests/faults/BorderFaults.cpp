@@ -60,14 +60,16 @@ public:
             starts.back() = tailColumn(h);
         }
         // A column is fetched a row before it is used.
-        std::vector<T8> row = starts;
-        row.resize(itsNT);
+        std::vector<T8> row(itsNT);
+        for (std::size_t u = 0; u < row.size(); ++u) {
+            row[u] = starts[startOf(u)];
+        }
         for (std::size_t i = 0; i < starts.size(); ++i) {
             const bool unknown = rules::isFirstPass(h) && i + 1 < starts.size();
             T8& fetched = row[i % itsNT];
             const T8 start = unknown ? T8{} : backwardStart(fetched, starts[i]);
             if (i + itsNT < starts.size()) {
-                fetched = starts[i + itsNT];
+                fetched = starts[startOf(i + itsNT)];
             }
             if (!runWindow(h, i, start)) {
                 return false;
@@ -117,6 +119,12 @@ private:
     virtual T8 forwardKept(const Place&, const T8&, const T8& reached)
     {
         return border(reached);
+    }
+
+    /// The window whose start column a window fetches.
+    virtual std::size_t startOf(std::size_t i) const
+    {
+        return i;
     }
 
     /// From which column a window starts: of the one fetched, and the one held by now.
@@ -254,6 +262,94 @@ class ForwardOfOtherCode : public Borders {
     }
 };
 
+/// Border columns of an earlier pass, whatever its code.
+template <unsigned passes>
+class ForwardOfEarlierPass : public Borders {
+    using Borders::Borders;
+
+    T8 forwardStart(const Place& place, const T8& held, const T8&) override
+    {
+        return place.u == 0 ? held : place.h < passes ? T8{} : itsKept[place.h - passes][place.u];
+    }
+
+    T8 forwardKept(const Place& place, const T8&, const T8& reached) override
+    {
+        itsKept.resize(place.h + 1);
+        itsKept.back().push_back(border(reached));
+        return border(reached);
+    }
+
+    std::vector<std::vector<T8>> itsKept;  ///< of each pass
+};
+
+/// Each segment but the last one starts from what it has reached itself.
+class ForwardOfNeighbour : public Borders {
+    using Borders::Borders;
+
+    T8 forwardStart(const Place& place, const T8& held, const T8&) override
+    {
+        const bool hasNext = place.u + 1 < forwardStarts(place.h).size();
+        return place.u > 0 && hasNext ? forwardStarts(place.h)[place.u + 1] : held;
+    }
+};
+
+class ForwardOfStepBefore : public Borders {
+    using Borders::Borders;
+
+    T8 forwardKept(const Place& place, const T8&, const T8& reached) override
+    {
+        return border(place.u == 0 ? reached : itsAlpha[itsAlphaSegment[place.u].from - 1]);
+    }
+};
+
+/// Each window but the first and the last one starts from the column of the window before.
+class BackwardOfNeighbour : public Borders {
+    using Borders::Borders;
+
+    std::size_t startOf(std::size_t i) const override
+    {
+        return i > 0 && i + 1 < itsBetaSegment.size() ? i - 1 : i;
+    }
+};
+
+/// Windows that start some steps behind, except the last one.
+template <int steps>
+class ShiftedWindows : public FaultyDecoder {
+    using FaultyDecoder::FaultyDecoder;
+
+    bool allocate(unsigned int blockSize) override
+    {
+        const bool allocated = FaultyDecoder::allocate(blockSize);
+        const rules::Cut cut(K(), itsNumPU, itsThreadsPerPU);
+        for (std::uint32_t i = 0; i < cut.windows(); ++i) {
+            const rules::Window window = cut.window(i);
+            itsBetaSegment[i] = {cut.startsAtTail(window) ? window.last : shifted(window.last),
+                                 window.first == 0 ? 0 : shifted(window.first - 1)};
+        }
+        return allocated;
+    }
+
+    static std::uint32_t shifted(std::uint32_t step)
+    {
+        return step + static_cast<std::uint32_t>(steps);
+    }
+};
+
+class LateSegments : public FaultyDecoder {
+    using FaultyDecoder::FaultyDecoder;
+
+    bool allocate(unsigned int blockSize) override
+    {
+        const bool allocated = FaultyDecoder::allocate(blockSize);
+        const std::uint32_t length = K() / itsNT;
+        for (std::uint32_t u = 1; u < itsNT; ++u) {
+            itsAlphaSegment[u].from = u * length + 1;
+            itsAlphaSegment[u - 1].to = u * length + 1;
+        }
+        return allocated;
+    }
+};
+
 class BackwardBitsKept : public Borders {
     using Borders::Borders;
 
@@ -343,6 +439,15 @@ const std::vector<Fault>& borderFaults()
         inDecoder<ForwardLate>("forward_border_late"),
         inDecoder<ForwardEarly>("forward_border_early"),
         inDecoder<ForwardOfOtherCode>("forward_border_other_code"),
+        inDecoder<OtherMask<-1152>>("border_bit_lost"),
+        inDecoder<ForwardOfEarlierPass<1>>("forward_border_both_codes"),
+        inDecoder<ForwardOfEarlierPass<3>>("forward_border_third_pass"),
+        inDecoder<ForwardOfNeighbour>("forward_border_neighbour"),
+        inDecoder<ForwardOfStepBefore>("forward_border_step_before"),
+        inDecoder<LateSegments>("segments_late"),
+        inDecoder<ShiftedWindows<1>>("windows_early"),
+        inDecoder<ShiftedWindows<-1>>("windows_late"),
+        inDecoder<BackwardOfNeighbour>("backward_border_neighbour"),
         inDecoder<BackwardBitsKept>("backward_bits_kept"),
         inDecoder<BackwardEarly>("backward_border_early"),
         inDecoder<BackwardStale>("backward_border_stale"),

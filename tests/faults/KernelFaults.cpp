@@ -71,12 +71,14 @@ class BranchesOfEightBits : public OtherBranches {
     }
 };
 
-class BranchesOfSevenBits : public OtherBranches {
+template <int bits>
+class NarrowBranches : public OtherBranches {
     using OtherBranches::OtherBranches;
 
     short branch(int sum, bool) const override
     {
-        return wrap16(clip(sum, lowestBranch / 2, highestBranch / 2 - 8));
+        constexpr int end = 16 << (bits - 1);
+        return wrap16(clip(sum, -end, end - 16));
     }
 };
 
@@ -265,10 +267,12 @@ struct Saturated {
     }
 };
 
-struct ElevenBits {
+template <int bits>
+struct Wrapped {
     static constexpr short of(int sum)
     {
-        return static_cast<short>(wrap16(2 * sum) / 2);
+        constexpr int above = 1 << (12 - bits);
+        return static_cast<short>(wrap16(above * sum) / above);
     }
 };
 
@@ -338,6 +342,133 @@ public:
     }
 };
 
+short lesserOf(int c1, int c2)
+{
+    return wrap16(wrap16(c1 - c2) < 0 ? c1 : c2);
+}
+
+/// One state keeps the lesser of its candidates.
+class ForwardLesser : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    T8* alpha(unsigned n, const T8* g, T8* a) override
+    {
+        constexpr unsigned state = 5;
+        constexpr unsigned one = rules::predecessor(state, 1);
+        constexpr unsigned zero = rules::predecessor(state, 0);
+        for (unsigned j = 1; j < n; ++j) {
+            FaultyEngine::alpha(2, g + j - 1, a + j - 1);
+            const short branch = g[j - 1][rules::branch(one)];
+            a[j][state] = lesserOf(a[j - 1][one] + branch, a[j - 1][zero] - branch);
+        }
+        return a + n;
+    }
+};
+
+class BackwardLesser : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    T8* beta(unsigned n, const T8* g, T8* b) override
+    {
+        constexpr unsigned state = 2;
+        for (unsigned j = 1; j < n; ++j, --g, --b) {
+            FaultyEngine::beta(2, g, b);
+            const T8& from = *b;
+            const short branch = (*g)[rules::branch(state)];
+            (*(b - 1))[state] =
+                lesserOf(from[rules::successor(state, 1)] + branch, from[rules::successor(state, 0)] - branch);
+        }
+        return b - 1;
+    }
+};
+
+/// A decision in the tree of max-log-MAP's ratios keeps the lesser: the one between two states or, if it has none, the
+/// one between the two halves.
+template <unsigned bit, int pair>
+class RatioLesser : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        for (unsigned k = 0; k < n; ++k) {
+            out[k] = wrap16(best(1, a[k], b[k], g[k]) - best(0, a[k], b[k], g[k]));
+        }
+        return out + n;
+    }
+
+    static short decided(int c1, int c2, bool takesLesser)
+    {
+        const short greater = rules::maxWrap(wrap16(c1), wrap16(c2));
+        return takesLesser ? lesserOf(c1, c2) : greater;
+    }
+
+    static short best(unsigned of, const T8& a, const T8& b, const T8& g)
+    {
+        std::array<short, 4> pairs{};
+        for (unsigned i = 0; i < pairs.size(); ++i) {
+            const auto path = [&](unsigned state) {
+                return a[state] + b[rules::successor(state, of)];
+            };
+            const short kept = decided(path(2 * i + 1), path(2 * i), of == bit && pair == static_cast<int>(i));
+            pairs[i] = wrap16(of != 0 ? kept + g[i] : kept - g[i]);
+        }
+        return decided(decided(pairs[0], pairs[1], false), decided(pairs[2], pairs[3], false), of == bit && pair < 0);
+    }
+};
+
+/// Operands of another step than the one at hand.
+class RatioOfNextBranch : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        FaultyEngine::llr(n - 1, a, b, g + 1, out);
+        return out + n;
+    }
+};
+
+class RatioOfBranchBefore : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        FaultyEngine::llr(1, a, b, g, out);
+        return FaultyEngine::llr(n - 1, a + 1, b + 1, g, out + 1);
+    }
+};
+
+class RatioOfNextForward : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        FaultyEngine::llr(n - 1, a + 1, b, g, out);
+        return out + n;
+    }
+};
+
+class ForwardOfNextBranch : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    T8* alpha(unsigned n, const T8* g, T8* a) override
+    {
+        return FaultyEngine::alpha(n, g + 1, a);
+    }
+};
+
+/// A bit of the address of the forward metrics' memory is stuck where the ratios read it.
+class RatioAddressBit : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        for (unsigned k = 0; k < n; ++k) {
+            FaultyEngine::llr(1, a + (k & ~32U), b + k, g + k, out + k);
+        }
+        return out + n;
+    }
+};
+
 /// The last subtraction of a ratio is wider and saturates.
 class UnwrappedRatios : public FaultyEngine {
     using FaultyEngine::FaultyEngine;
@@ -367,7 +498,8 @@ const std::vector<Fault>& kernelFaults()
     static const std::vector<Fault> faults = {
         inEngine<UnclippedBranches>("branch_unclipped"),
         inEngine<BranchesOfEightBits>("branch_eight_bits"),
-        inEngine<BranchesOfSevenBits>("branch_seven_bits"),
+        inEngine<NarrowBranches<7>>("branch_seven_bits"),
+        inEngine<NarrowBranches<5>>("branch_five_bits"),
         inEngine<NegatedParity>("parity_sign"),
         inEngine<ParityNegatedInEight>("parity_negated_in_eight"),
         inEngine<IntrinsicDoubledInEight>("doubled_in_eight"),
@@ -375,9 +507,19 @@ const std::vector<Fault>& kernelFaults()
         inEngine<ForwardCorrectedEarly>("forward_corrected_early"),
         inEngine<StatesSwapped>("forward_state_swapped"),
         inEngine<OtherMetrics<Saturated>>("metrics_unwrapped"),
-        inEngine<OtherMetrics<ElevenBits>>("metrics_eleven_bits"),
+        inEngine<OtherMetrics<Wrapped<11>>>("metrics_eleven_bits"),
+        inEngine<OtherRatios<Wrapped<7>>>("ratio_seven_bits"),
         inEngine<StoredInElevenBits>("metrics_stored_in_eleven_bits"),
         inEngine<KeptInElevenBits>("metrics_kept_in_eleven_bits"),
+        inEngine<ForwardLesser>("forward_lesser"),
+        inEngine<BackwardLesser>("backward_lesser"),
+        inEngine<RatioLesser<1, 2>>("ratio_lesser_of_states"),
+        inEngine<RatioLesser<0, -1>>("ratio_lesser_of_halves"),
+        inEngine<RatioOfNextBranch>("ratio_branch_behind"),
+        inEngine<RatioOfBranchBefore>("ratio_branch_before"),
+        inEngine<RatioOfNextForward>("ratio_forward_behind"),
+        inEngine<ForwardOfNextBranch>("forward_branch_behind"),
+        inEngine<RatioAddressBit>("ratio_address_bit"),
         inEngine<NegatedRatios>("ratio_sign"),
         inEngine<RoundedRatios>("ratio_rounding"),
         inEngine<UnwrappedRatios>("ratio_unwrapped"),

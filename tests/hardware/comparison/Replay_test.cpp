@@ -85,7 +85,7 @@ TEST(Replay, TakesTheModelsValueForAnInputThatIsNotInTheDump)
     const Place ratio = {0, signalsOf(Stage::ratio).first, 3};
     dump.set(ratio, model.values.at(ratio));
     const Column column = Replay(model, dump).column(0, Stage::ratio, 3);
-    EXPECT_FALSE(column.complete);
+    EXPECT_FALSE(column.sources.complete);
     EXPECT_EQ(column.values[0], model.values.at(ratio));
 }
 

@@ -1,0 +1,181 @@
+// KnownMistakes: each mistake is named where all values have it, and not where right ones contradict it.
+#include "hardware/comparison/KnownMistakes.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <iostream>
+#include <string>
+#include <vector>
+
+#include "hardware/comparison/Comparison.h"
+#include "hardware/comparison/Patterns.h"
+#include "hardware/comparison/Replay.h"
+#include "support/Blocks.h"
+
+namespace {
+
+using namespace morvik::comparison;
+using morvik::Stage;
+namespace blocks = morvik::blocks;
+
+Model modelOf(unsigned K, int algorithm, int amplitude)
+{
+    blocks::Random random(1);
+    blocks::Block block = blocks::encode(blocks::randomBits(random, K), amplitude);
+    blocks::addNoise(random, 14, block);
+    auto generics = veltra_ip_morvik_v1_0_get_default_generics();
+    generics.C_ALGORITHM_TYPE = algorithm;
+    return computeModel({block.sys, block.par1, block.par2}, generics, 2, std::cerr);
+}
+
+/// The steps of a stage, those that others start from first, as a core with one thread computes them.
+std::vector<unsigned> stepsOneByOne(const Model& model, Stage stage)
+{
+    std::vector<unsigned> steps = stepsInOrder(model.cut, stage);
+    std::sort(steps.begin(), steps.end());
+    if (stage == Stage::backward) {
+        std::reverse(steps.begin(), steps.end());
+    }
+    return steps;
+}
+
+/// The dump of a core that makes a mistake in each operation that is chosen by its stage.
+template <class Choose>
+Values dumpWith(const Model& model, const Mistake& mistake, Choose isChosen)
+{
+    Values dump = model.values;
+    const Replay replay(model, dump);
+    for (unsigned pass = 0; pass < dump.passes(); ++pass) {
+        for (const Stage stage : morvik::stages) {
+            const auto [first, count] = morvik::signalsOf(stage);
+            for (const unsigned step : stepsOneByOne(model, stage)) {
+                const Column column = replay.column(pass, stage, step, isChosen(stage) ? mistake : Mistake());
+                for (unsigned i = 0; i < count && !column.sources.open; ++i) {
+                    dump.set({pass, first + i, step}, column.values[i]);
+                }
+            }
+        }
+    }
+    return dump;
+}
+
+/// What is found in a stage; nothing if it has no faults.
+std::optional<Finding> findingIn(const Model& model, const Values& dump, Stage stage)
+{
+    const Comparison comparison = compare(model, dump);
+    for (const Finding& finding : findPatterns(model, dump, comparison)) {
+        if (finding.stage == stage) {
+            return finding;
+        }
+    }
+    return std::nullopt;
+}
+
+bool names(const Finding& finding, const std::string& text)
+{
+    return std::find(finding.how.begin(), finding.how.end(), text) != finding.how.end();
+}
+
+std::string textOf(const Finding& finding)
+{
+    std::string text;
+    for (const std::string& each : finding.how) {
+        text += each + "; ";
+    }
+    return text + finding.shared + " " + finding.where + " " + std::to_string(finding.faults);
+}
+
+class Mistakes : public testing::TestWithParam<Stage> {};
+
+TEST_P(Mistakes, AreNamedUnlessARightValueContradictsThem)
+{
+    constexpr std::size_t fewest = 12;
+    const Model model = modelOf(256, 1, 48);
+    blocks::Random random(7);
+    std::size_t named = 0;
+    for (const KnownMistake& each : knownMistakes(model, GetParam())) {
+        const auto isWrong = [&](Stage stage) {
+            return stage == GetParam() || each.reach == Candidate::core;
+        };
+        const Values all = dumpWith(model, each.mistake, isWrong);
+        const auto found = findingIn(model, all, GetParam());
+        if (!found || found->faults < fewest) {
+            continue;
+        }
+        if (each.rank == Candidate::telling) {
+            EXPECT_TRUE(names(*found, each.text)) << each.text << "\n" << textOf(*found);
+            ++named;
+        }
+        const Values some =
+            dumpWith(model, each.mistake, [&](Stage stage) { return isWrong(stage) && random() % 2 == 0; });
+        const auto half = findingIn(model, some, GetParam());
+        if (half && half->faults < found->faults) {
+            const bool isElsewhere = half->where != found->where;  // "in half-iteration 3 alone" is true then
+            EXPECT_FALSE(names(*half, each.text) && !isElsewhere) << each.text << "\n" << textOf(*half);
+        }
+    }
+    EXPECT_GE(named, 8U);
+}
+
+INSTANTIATE_TEST_SUITE_P(Stages, Mistakes, testing::ValuesIn(morvik::stages), [](const auto& each) {
+    return morvik::nameOf(each.param);
+});
+
+/// A core whose values of a stage are garbage at some steps.
+TEST_P(Mistakes, AreNotNamedForGarbage)
+{
+    for (const int algorithm : {0, 1, 2}) {
+        const Model model = modelOf(256, algorithm, 16);
+        for (const unsigned one : {1U, 5U, 40U}) {
+            blocks::Random random(one);
+            Values dump = model.values;
+            const auto [first, count] = morvik::signalsOf(GetParam());
+            for (unsigned step = 0; step < model.cut.K(); ++step) {
+                const Place place = {3, first + static_cast<unsigned>(random() % count), step};
+                if (random() % one == 0) {
+                    dump.set(place, static_cast<std::int16_t>(static_cast<int>(random() % 256) - 128));
+                }
+            }
+            const auto found = findingIn(model, dump, GetParam());
+            EXPECT_TRUE(found && found->how.empty()) << algorithm << ' ' << one << ' ' << textOf(*found);
+        }
+    }
+}
+
+TEST(FittedMistakes, TakeTheSimplestFactorThatFits)
+{
+    const Model model = modelOf(256, 1, 16);
+    for (const int number : {32, 33}) {
+        const Values dump =
+            dumpWith(model, {Mistake::scaledBy, number}, [](Stage stage) { return stage == Stage::extrinsic; });
+        const auto found = findingIn(model, dump, Stage::extrinsic);
+        ASSERT_TRUE(found);
+        const std::vector<std::string> expected = {number == 32 ? "the factor is 0.5, not 0.75 (rule 14)"
+                                                                : "the factor is 0.515625, not 0.75 (rule 14)"};
+        EXPECT_EQ(found->how, expected);
+    }
+}
+
+TEST(FittedMistakes, TellTheRangeOfAnAddress)
+{
+    // Segments of 68 steps, in windows of 34: addresses that count from the start of each are not those of the block.
+    const Model model = modelOf(272, 1, 16);
+    const auto foundOf = [&](AddressError::Range range) {
+        const AddressError error = {AddressError::stuckHigh, 3, range};
+        const Values dump =
+            dumpWith(model, {Mistake::forwardMisread, error}, [](Stage stage) { return stage == Stage::ratio; });
+        const auto found = findingIn(model, dump, Stage::ratio);
+        return found ? textOf(*found) : "";
+    };
+    const auto expectFound = [&](AddressError::Range range, const std::string& text) {
+        const std::string found = foundOf(range);
+        EXPECT_EQ(found.rfind("bit 3 of the address of forward metrics" + text + " reads as 1 (rule 8); ", 0), 0U)
+            << found;
+    };
+    expectFound(AddressError::block, "");
+    expectFound(AddressError::segment, " within a segment");
+    expectFound(AddressError::window, " within a window");
+}
+
+}  // namespace
