@@ -6,6 +6,7 @@
 #include "Vectors.h"
 #include "ber/Merge.h"
 #include "compare/Compare.h"
+#include "coverage/Coverage.h"
 #include "decode/Decode.h"
 #include "doctor/Doctor.h"
 #include "info/Info.h"
@@ -35,6 +36,7 @@ Program morvikProgram()
         addVectors(app),
         addTrace(app),
         addCompare(app),
+        addCoverage(app),
         addDoctor(app),
         addInfo(app),
         addSelfTest(app),

@@ -20,6 +20,7 @@
 #include "base/Text.h"
 #include "base/Thousandths.h"
 #include "ber/LinkOptions.h"
+#include "coverage/CoverOptions.h"
 #include "hardware/vectors/Set.h"
 #include "link/coding/CodeBlocks.h"
 #include "simulation/Plan.h"
@@ -35,6 +36,7 @@ struct Options {
     LinkOptions link;              ///< of transport blocks
     std::optional<int> milliEbn0;  ///< as given, like
     std::optional<int> milliEsn0;  ///< this one
+    CoverOptions situations;
     vectors::Settings settings;
     UnitVectors units;
 };
@@ -44,7 +46,9 @@ std::string blockText(const Options& options)
 {
     const vectors::Settings& settings = options.settings;
     if (settings.transport.empty()) {
-        return " --block-size " + listed(settings.blockSizes, [](unsigned K) { return std::to_string(K); });
+        return settings.blockSizes.empty()
+                   ? ""
+                   : " --block-size " + listed(settings.blockSizes, [](unsigned K) { return std::to_string(K); });
     }
     return commandOf(options.link);
 }
@@ -77,6 +81,7 @@ std::string commandOf(const Options& options, const vectors::Settings& settings)
     command += noiseText(options);
     command += " --seed " + number(settings.seed);
     command += settings.directed ? "" : " --no-directed";
+    command += coverText(settings);
     command += " --format " + listed(settings.formats, itself);
     command += " --width " + number(settings.width);
     command += settings.separateStreams ? " --streams separate" : "";
@@ -146,14 +151,19 @@ int make(Options options)
     manifest.settings = options.settings;
     manifest.settings.generics = options.decoder.generics;
     manifest.settings.iterations = options.decoder.iterations;
-    if (manifest.settings.blocks == 0 && !manifest.settings.directed) {
+    if (manifest.settings.blocks == 0 && !manifest.settings.directed && manifest.settings.cover.empty()) {
         throw base::Error("--blocks 0 and --no-directed together leave no block");
     }
+    checkCoverOptions(options.situations, manifest.settings);
     manifest.command = commandOf(options, manifest.settings);
-    const vectors::Manifest made = vectors::makeSet(options.output, manifest);
+    coverage::Counts counts;
+    const vectors::Manifest made =
+        vectors::makeSet(options.output, manifest, options.situations.isCounted ? &counts : nullptr);
+    bool isCovered = true;
+    const std::string situations = tellSituations(options.situations, made.settings, counts, isCovered);
     print(coreLine(made.settings.generics, made.settings.iterations) + base::visible(options.output) + ": " +
-          blocksAndFormats(made) + '\n');
-    return success;
+          blocksAndFormats(made) + '\n' + situations);
+    return isCovered ? success : differencesFound;
 }
 
 /// All files that checking the set reads.
@@ -215,12 +225,12 @@ int run(const CLI::App& command, const Options& options)
     if (!options.units.units.empty()) {
         return makeUnits(command, options);
     }
-    const bool hasBlocks = !options.settings.blockSizes.empty() || options.link.hasTransportBlocks();
+    const bool hasBlocks =
+        !options.settings.blockSizes.empty() || options.link.hasTransportBlocks() || !options.settings.cover.empty();
     if (options.output.empty() || !hasBlocks) {
         throw base::Error(
-            "--out and --block-size, --transport-block-size, --mcs or --unit, or --check, are required; see 'morvik "
-            "vectors "
-            "--help'");
+            "--out and --block-size, --transport-block-size, --mcs, --cover or --unit, or --check, are required; see "
+            "'morvik vectors --help'");
     }
     return make(options);
 }
@@ -306,10 +316,14 @@ changes, extreme tags. With transport blocks, random blocks are their code block
 of rate recovery after each transmission: punctured, repeated, combined, saturated, with filler
 bits. docs/vectors.md describes the layout.
 
+After a set is made, a line tells how many situations of the arithmetic its blocks meet, such as clips,
+wraps and ties; docs/coverage.md describes them.
+
 With --unit, the folder gets a table for each unit, with its inputs and expected outputs, and a file
 NAME.json that counts what the cases meet: clips, wraps, ties, corrections. docs/units.md tells more.
 
-Exit status: 0 written, or no difference, 1 a difference was found, 2 bad input or usage.
+Exit status: 0 written, or no difference, 1 a difference was found, or --cover is not met, 2 bad input or
+usage.
 
 Example: words for $readmemh, and a check of them
   morvik vectors --out k40 --block-size 40 --num-pu 8 --format memh,csv
@@ -329,6 +343,7 @@ Command addVectors(CLI::App& app)
         ->type_name("DIR")
         ->excludes(output);
     addBlockOptions(*command, *options);
+    addCoverOptions(*command, options->situations, options->settings);
     addDecoderOptions(*command, options->decoder);
     addFileOptions(*command, options->settings);
     addUnitOptions(*command, options->units);

@@ -218,9 +218,28 @@ MORVIK_CHECKER_API int32_t morvik_checker_standing(const morvik_checker* checker
  *
  * @param checker    a checker
  * @return           lines, separated by line feeds, valid until the next call with this checker; an empty text without
- *                   a block, after a message
+ *                   a block, after a message. The last line is a summary of morvik_checker_situations
  */
 MORVIK_CHECKER_API const char* morvik_checker_report(morvik_checker* checker);
+
+/** Counts the situations of the arithmetic that all blocks of the checker have met: clips, wraps, ties, borders and
+ * others at values that have been observed and agree. `morvik coverage` reads such counts, and sums those of several
+ * simulations.
+ *
+ * @param checker    a checker
+ * @return           a CSV file of lines separated by line feeds, valid until the next call with this checker; an empty
+ *                   text after a message if the configuration was refused
+ */
+MORVIK_CHECKER_API const char* morvik_checker_situations(morvik_checker* checker);
+
+/** Writes them to a file, which appears complete or not at all.
+ *
+ * @param checker      a checker
+ * @param file_name    name of the file, which is replaced
+ * @return             MORVIK_CHECKER_AGREES; or MORVIK_CHECKER_REFUSED, and a message says why, or
+ *                     MORVIK_CHECKER_OUT_OF_MEMORY
+ */
+MORVIK_CHECKER_API int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file_name);
 
 /** Takes the oldest message from the queue.
  *

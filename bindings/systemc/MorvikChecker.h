@@ -131,6 +131,13 @@ public:
         return isPartial ? MORVIK_CHECKER_AGREES : standing;
     }
 
+    /// Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`. Returns
+    /// MORVIK_CHECKER_AGREES, or MORVIK_CHECKER_REFUSED after an error if the file cannot be written.
+    int writeSituations(const std::string& fileName)
+    {
+        return answered(morvik_checker_write_situations(itsChecker.get(), fileName.c_str()));
+    }
+
 private:
     int answered(int answer)
     {

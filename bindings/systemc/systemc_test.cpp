@@ -110,6 +110,9 @@ void checkChecker()
                  "morvik: block 0: compared 1 of 2 half-iterations, 1 of 1862 "
                  "values: all equal to the model");
     expectAnswer(one.report(), MORVIK_CHECKER_INCOMPLETE, "morvik: ERROR:checker:Values are missing");
+    expectAnswer(one.writeSituations("/nowhere/met.csv"),
+                 MORVIK_CHECKER_REFUSED,
+                 "morvik: ERROR:checker:/nowhere/met.csv: cannot be written: No such file or directory");
     expectAnswer(
         one.observe(MORVIK_CHECKER_LLR, 1, 4, sc_dt::sc_lv<12>("0000000x0000")),
         MORVIK_CHECKER_DIFFERS,

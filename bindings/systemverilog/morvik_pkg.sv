@@ -38,6 +38,7 @@ package morvik_pkg;
     import "DPI-C" function int morvik_checker_expected(input chandle handle, input int signal);
     import "DPI-C" function int morvik_checker_standing(input chandle handle);
     import "DPI-C" function string morvik_checker_report(input chandle handle);
+    import "DPI-C" function int morvik_checker_write_situations(input chandle handle, input string file_name);
     import "DPI-C" function string morvik_checker_message(input chandle handle);
 
     import "DPI-C" function void morvik_dpi_unit_put(input int value);
@@ -313,6 +314,12 @@ package morvik_pkg;
             if (standing == CHECKER_INCOMPLETE)
                 add_message("ERROR:checker:Values are missing");
             return standing;
+        endfunction
+
+        // Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`. Returns
+        // CHECKER_AGREES, or CHECKER_REFUSED after an error if the file cannot be written.
+        function int write_situations(string file_name);
+            return answered(morvik_checker_write_situations(handle, file_name));
         endfunction
 
         // Releases the checker. Another call does nothing.

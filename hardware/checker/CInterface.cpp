@@ -10,6 +10,8 @@
 #include <utility>
 
 #include "Checker.h"
+#include "base/Error.h"
+#include "base/OutputFile.h"
 #include "hardware/testbench/Decoder.h"
 #include "hardware/testbench/SizeHint.h"
 #include "morvik_checker.h"
@@ -369,6 +371,35 @@ const char* morvik_checker_report(morvik_checker* checker)
         return MORVIK_CHECKER_AGREES;
     });
     return checker->text.c_str();
+}
+
+const char* morvik_checker_situations(morvik_checker* checker)
+{
+    if (checker == nullptr) {
+        return "";
+    }
+    checker->text.clear();
+    guarded(checker, [](morvik_checker& each) {
+        each.text = morvik::coverage::textOf(openOf(each).situations());
+        return MORVIK_CHECKER_AGREES;
+    });
+    return checker->text.c_str();
+}
+
+int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file_name)
+{
+    return guarded(checker, [&](morvik_checker& each) {
+        const Checker& open = openOf(each);
+        if (file_name == nullptr) {
+            throw Wrong{"The file name is a null pointer"};
+        }
+        try {
+            morvik::base::writeFile(file_name, morvik::coverage::textOf(open.situations()));
+        } catch (const morvik::base::Error& error) {
+            throw Wrong{error.what()};
+        }
+        return MORVIK_CHECKER_AGREES;
+    });
 }
 
 const char* morvik_checker_message(morvik_checker* checker)

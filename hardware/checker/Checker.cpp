@@ -3,17 +3,45 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <numeric>
 #include <sstream>
 #include <utility>
 
+#include "base/Text.h"
 #include "hardware/comparison/Comparison.h"
 #include "hardware/comparison/Coverage.h"
 #include "hardware/comparison/Dump.h"
 #include "hardware/comparison/NameMap.h"
 #include "hardware/comparison/Report.h"
+#include "hardware/coverage/Meetings.h"
 #include "hardware/testbench/Decoder.h"
 
 namespace morvik::checker {
+
+namespace {
+
+/// Counts the situations at values that a predicate accepts.
+template <class IsTaken>
+class ObservedCounter : public coverage::Taker {
+public:
+    ObservedCounter(coverage::CoreCounts& counts, IsTaken isTaken) : itsCounts(counts), itsIsTaken(isTaken) {}
+
+    void atValue(unsigned situation, const Place& place) override
+    {
+        itsCounts.met[situation] += itsIsTaken(place) ? 1U : 0U;
+    }
+
+    void ofBlock(unsigned situation) override
+    {
+        ++itsCounts.met[situation];
+    }
+
+private:
+    coverage::CoreCounts& itsCounts;
+    IsTaken itsIsTaken;
+};
+
+}  // namespace
 
 Checker::Checker(const veltra_ip_morvik_v1_0_generics& generics) : itsGenerics(generics)
 {
@@ -38,6 +66,7 @@ void Checker::start(const SoftBlock& block, unsigned iterations, std::ostream& w
 
 void Checker::forget()
 {
+    itsSituations = situations();
     itsModel.reset();
     itsPasses = 0;
     itsSteps = 0;
@@ -97,6 +126,30 @@ std::string Checker::formatted(Format format) const
     return format({found, coverage, *itsModel, record, name(), true, {}, "the record", true});
 }
 
+bool Checker::isRight(const Place& place) const
+{
+    const auto is = [this](const Place& each) {
+        const Pair& pair = itsPairs[index(each)];
+        return pair.got == pair.wanted;
+    };
+    return is(place) || is({place.pass, comparison::twinOf(place.signal), place.step});
+}
+
+coverage::Counts Checker::situations() const
+{
+    coverage::Counts sum = itsSituations;
+    const std::uint64_t observed = std::accumulate(itsCounts.begin(), itsCounts.end(), std::uint64_t{0});
+    if (observed > itsDifferences) {
+        coverage::CoreCounts counts;
+        counts.core = coverage::coreOf(itsGenerics);
+        counts.blocks = 1;
+        ObservedCounter counter(counts, [this](const Place& place) { return isRight(place); });
+        coverage::findSituations(*itsModel, counter);
+        sum.add(counts);
+    }
+    return sum;
+}
+
 std::string Checker::headline() const
 {
     return formatted(comparison::headlineOf);
@@ -112,7 +165,10 @@ std::string Checker::report() const
     if (std::all_of(itsCounts.begin(), itsCounts.end(), [](std::uint32_t count) { return count == 0; })) {
         return name() + ": nothing has been observed\n";
     }
-    return formatted(comparison::textOf);
+    const coverage::Counts counts = situations();
+    constexpr std::size_t namesNone = 0;
+    return formatted(comparison::textOf) + "situations: " + coverage::summary(counts, namesNone) + ", in " +
+           base::counted(counts.blocks(), "block") + '\n';
 }
 
 }  // namespace morvik::checker

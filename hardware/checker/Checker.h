@@ -11,6 +11,7 @@
 
 #include "hardware/comparison/Model.h"
 #include "hardware/comparison/Values.h"
+#include "hardware/coverage/Counts.h"
 #include "hardware/testbench/SoftBlock.h"
 #include "morvik_v1_0_bitacc_cmodel.h"
 
@@ -39,11 +40,11 @@ public:
     /// Throws Refusal if the generics are not allowed.
     explicit Checker(const veltra_ip_morvik_v1_0_generics& generics);
 
-    /// Decodes a block, and forgets the one before. The library's warnings go to `warnings`. Throws Refusal, and has no
+    /// Decodes a block, and ends the one before. The library's warnings go to `warnings`. Throws Refusal, and has no
     /// block then.
     void start(const SoftBlock& block, unsigned iterations, std::ostream& warnings);
 
-    /// Ends the block, of which nothing is known any more.
+    /// Ends the block, of which nothing is known any more but the situations that it has met.
     void forget();
 
     bool hasBlock() const
@@ -98,8 +99,12 @@ public:
     std::string headline() const;
     std::string firstDifference() const;
 
-    /// What has been compared, what has not, and all differences. There must be a block.
+    /// What has been compared, what has not, all differences, and a line about situations(). There must be a block.
     std::string report() const;
+
+    /// The situations of the arithmetic that all blocks so far have met, as far as it was observed: those at values
+    /// that were observed and are right.
+    coverage::Counts situations() const;
 
 private:
     /// What the core computes at a place, and what has been observed there; or Values::missing.
@@ -119,11 +124,15 @@ private:
     void forAllPlaces(Function function) const;
 
     std::string name() const;
+
+    /// Whether the value of a place, or of its twin, has been observed and is right.
+    bool isRight(const Place& place) const;
     template <class Format>
     std::string formatted(Format format) const;
 
     veltra_ip_morvik_v1_0_generics itsGenerics;
-    std::uint64_t itsBlocks = 0;  ///< started
+    std::uint64_t itsBlocks = 0;     ///< started
+    coverage::Counts itsSituations;  ///< of the blocks before
     std::optional<comparison::Model> itsModel;
     unsigned itsPasses = 0;
     unsigned itsSteps = 0;

@@ -1,6 +1,7 @@
 // Core: the model as the source of expected values.
 #include "Core.h"
 
+#include "hardware/comparison/Model.h"
 #include "rules/Formats.h"
 #include "rules/Tail.h"
 
@@ -57,6 +58,13 @@ Expected Core::expect(const Stimulus& stimulus)
         expected.internal = internalSteps(Passes(block, itsSettings.generics, itsMessages), itsSettings.iterations);
     }
     return expected;
+}
+
+coverage::CoreCounts Core::situations(const Stimulus& stimulus)
+{
+    itsMessages.str({});
+    return coverage::countsOf(
+        comparison::computeModel(softBlock(stimulus), itsSettings.generics, itsSettings.iterations, itsMessages));
 }
 
 }  // namespace morvik::vectors

@@ -6,6 +6,7 @@
 
 #include "Block.h"
 #include "Settings.h"
+#include "hardware/coverage/Counts.h"
 #include "hardware/testbench/Decoder.h"
 
 namespace morvik::vectors {
@@ -15,6 +16,9 @@ public:
     explicit Core(const Settings& settings);
 
     Expected expect(const Stimulus& stimulus);
+
+    /// Which situations of the arithmetic the block meets.
+    coverage::CoreCounts situations(const Stimulus& stimulus);
 
 private:
     Settings itsSettings;

@@ -10,6 +10,7 @@
 #include "base/Shown.h"
 #include "base/TextFile.h"
 #include "base/Thousandths.h"
+#include "hardware/coverage/Situations.h"
 #include "rules/Algorithms.h"
 #include "rules/BlockSizes.h"
 
@@ -34,6 +35,10 @@ Json parametersOf(const Settings& settings)
     json["ebn0_db"] = base::fromThousandths(settings.milliDecibels);
     json["seed"] = settings.seed;
     json["directed"] = settings.directed;
+    if (!settings.cover.empty()) {
+        json["cover"] = settings.cover;
+        json["cover_limit"] = settings.coverLimit;
+    }
     json["width"] = settings.width;
     json["separate_streams"] = settings.separateStreams;
     json["soft"] = settings.ratios;
@@ -106,6 +111,18 @@ std::vector<simulation::Point> transportFrom(const base::JsonMembers& json, cons
     return points;
 }
 
+std::vector<std::string> coverFrom(const base::JsonMembers& json)
+{
+    std::vector<std::string> names;
+    for (const base::Json& each : json.list("cover")) {
+        if (!each.is_string() || coverage::situationsNamed(each.get<std::string>()).empty()) {
+            json.refuse("cover", "expected a list of situations");
+        }
+        names.push_back(each.get<std::string>());
+    }
+    return names;
+}
+
 /// The settings of the set. What the core checks itself is not checked here.
 Settings settingsOf(const base::JsonMembers& json)
 {
@@ -130,6 +147,10 @@ Settings settingsOf(const base::JsonMembers& json)
     settings.milliDecibels = milliDecibelsFrom(json, "ebn0_db", 50);
     settings.seed = json.integer("seed", 0, UINT64_MAX);
     settings.directed = json.flag("directed");
+    if (json.has("cover")) {
+        settings.cover = coverFrom(json);
+        settings.coverLimit = word(json, "cover_limit");
+    }
     settings.separateStreams = json.flag("separate_streams");
     settings.ratios = json.flag("soft");
     settings.internal = json.flag("internal");

@@ -8,6 +8,7 @@
 #include "Blocks.h"
 #include "Checksum.h"
 #include "Core.h"
+#include "Cover.h"
 #include "Received.h"
 #include "SetFolder.h"
 #include "base/Error.h"
@@ -200,7 +201,12 @@ void expectBlocks(const std::string& folder, const Manifest& manifest)
                               ", its parameters make it " + wanted);
         }
     });
-    if (settings.directed != (random + received < manifest.blocks.size())) {
+    const auto covering = static_cast<std::uint64_t>(std::count_if(
+        manifest.blocks.begin(), manifest.blocks.end(), [](const auto& block) { return block.name == coverName; }));
+    if (covering > 0 && settings.cover.empty()) {
+        throw base::Error(manifestIn(folder) + ": names " + coverName + " blocks, its parameters make none");
+    }
+    if (settings.directed != (random + received + covering < manifest.blocks.size())) {
         throw base::Error(manifestIn(folder) + ": names " +
                           (settings.directed ? "no directed block" : "directed blocks") + ", its parameters make " +
                           (settings.directed ? "some" : "none"));
@@ -263,7 +269,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
 
 }  // namespace
 
-Manifest makeSet(const std::string& folder, Manifest manifest)
+Manifest makeSet(const std::string& folder, Manifest manifest, coverage::Counts* counts)
 {
     SetFolder set(folder);
     std::vector<BlockWriter> writers;
@@ -272,14 +278,29 @@ Manifest makeSet(const std::string& folder, Manifest manifest)
     }
     Core core(manifest.settings);
     CrcCheck crc(manifest.settings);
-    forEachStimulus(manifest.settings, [&](const Stimulus& stimulus) {
+    const bool isCounted = counts != nullptr || !manifest.settings.cover.empty();
+    coverage::Counts found;
+    const auto write = [&](const Stimulus& stimulus) {
         const Expected expected = core.expect(stimulus);
         for (BlockWriter& writer : writers) {
             writer.add(stimulus, expected);
         }
         const bool crcFits = stimulus.origin && crc.fits(*stimulus.origin, expected.bits);
         manifest.blocks.push_back({stimulus.name, stimulus.K, stimulus.tag, expected.tag, stimulus.origin, crcFits});
+    };
+    forEachStimulus(manifest.settings, [&](const Stimulus& stimulus) {
+        write(stimulus);
+        if (isCounted) {
+            found.add(core.situations(stimulus));
+        }
     });
+    cover(manifest.settings, core, found, write);
+    if (manifest.blocks.empty()) {
+        throw base::Error("no block has been drawn that meets what --cover names");
+    }
+    if (counts != nullptr) {
+        counts->add(found);
+    }
     for (std::size_t i = 0; i < writers.size(); ++i) {
         writers[i].finish();
         ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
@@ -309,6 +330,22 @@ CheckedSet checkSet(const std::string& folder)
     expectBlocks(folder, checked.manifest);
     expectNoOtherTable(folder, checked.manifest);
     return checked;
+}
+
+coverage::Counts situationsOf(const std::string& folder)
+{
+    expectPlaced(folder);
+    const Manifest manifest = readManifest(manifestIn(folder));
+    const Settings settings = blocksAlone(manifest);
+    BlockReader reader(folder, *tables::findFormat(manifest.formats.front().name), settings);
+    Core core(settings);
+    coverage::Counts counts;
+    Stimulus stimulus;
+    Expected expected;
+    while (reader.next(stimulus, expected)) {
+        counts.add(core.situations(stimulus));
+    }
+    return counts;
 }
 
 }  // namespace morvik::vectors

@@ -26,6 +26,9 @@ struct Settings {
     std::uint64_t seed = 1;
     bool directed = true;  ///< whether directed blocks follow the random ones
 
+    std::vector<std::string> cover;  ///< situations of hardware/coverage/, by names, that further blocks are to meet
+    std::uint32_t coverLimit = 500;  ///< blocks that are drawn for them
+
     std::vector<std::string> formats;
     unsigned width = 8;            ///< bits of a soft value in the files: 8 or 16
     bool separateStreams = false;  ///< whether memh has a file for each stream

@@ -128,6 +128,11 @@ public:
         return text;
     }
 
+    std::string situations()
+    {
+        return morvik_checker_situations(itsChecker.get());
+    }
+
 private:
     struct Destroy {
         void operator()(morvik_checker* checker) const
@@ -179,6 +184,7 @@ void addChecker(py::module_& module)
     checker.def("seen", &Checker::seen, py::arg("signal"));
     checker.def("standing", &Checker::standing);
     checker.def("report", &Checker::report);
+    checker.def("situations", &Checker::situations);
 }
 
 }  // namespace morvik::python

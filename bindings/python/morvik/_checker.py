@@ -106,6 +106,11 @@ class Checker:
         """Describes how much of the block was observed, and all differences."""
         return self._core.report()
 
+    def situations(self) -> str:
+        """How often all blocks so far have met each situation of the arithmetic, at values that were observed and agree:
+        the text of a CSV file, which ``morvik coverage`` reads."""
+        return self._core.situations()
+
     def __reduce__(self) -> NoReturn:
         raise TypeError("a morvik.Checker cannot be copied or pickled")
 

@@ -75,6 +75,21 @@ def test_blocks_and_checkers_are_independent(soft, checker):
     assert checker.report() == "block 1: nothing has been observed"
 
 
+def test_situations_are_those_of_all_blocks(block, checker):
+    def counts():
+        rows = [line.split(",") for line in checker.situations().splitlines()[1:]]
+        return {situation: int(count) for _, _, situation, count in rows}
+
+    assert not any(counts().values())
+    for time in (1, 2):
+        for step, ratio in enumerate(checker.ratios()):
+            assert checker.observe("llr", 3, step, ratio)
+        assert counts()["blocks"] == time
+        assert counts()["pass.later.natural"] == 40 * time
+        assert f"situations: {sum(map(bool, counts().values())) - 1} of 130 met, in {time} block" in checker.report()
+        checker.start(*block, iterations=2)
+
+
 def test_refusals(block, checker):
     with pytest.raises(morvik.Error, match="C_NUM_PU must be either 2, 4 or 8"):
         morvik.Checker(num_pu=3)

@@ -132,10 +132,13 @@ module wrong_use_tb;
         expect_answer(check, check.observe_row(SIGNAL_BETA, 3, 5, row), CHECKER_AGREES, "agrees");
         expect_answer(check, check.report(1), CHECKER_AGREES, "");
         expect_answer(check, check.report(), CHECKER_INCOMPLETE, "ERROR:checker:Values are missing");
+        expect_answer(check, check.write_situations("/nowhere/met.csv"), CHECKER_REFUSED,
+            "ERROR:checker:/nowhere/met.csv: cannot be written: No such file or directory");
         other = new(8);
         expect_answer(other, other.start(values(44), values(44), values(44), 1), CHECKER_AGREES, "");
         expect_answer(other, other.seen(SIGNAL_BETA), 0, "");
-        expect_answer(check, check.seen(SIGNAL_BETA), 1, "ERROR:checker:Values are missing");
+        expect_answer(check, check.seen(SIGNAL_BETA), 1,
+            "ERROR:checker:/nowhere/met.csv: cannot be written: No such file or directory");
         other.destroy();
         // A refused block is none: values are not those of the block before.
         expect_answer(check, check.start(values(44), values(43), values(44), 8), CHECKER_REFUSED,

@@ -3,9 +3,13 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdlib>
+#include <map>
+#include <sstream>
 
 #include "morvik_v1_0_batch.h"
 #include "support/Checkers.h"
+#include "support/TemporaryFolder.h"
 
 namespace {
 
@@ -172,8 +176,90 @@ TEST(Checker, CountsWhatItHasSeen)
                  "\n"
                  "signal      compared  missing  unknown  differences   faults   first difference\n"
                  "intrinsic          1      171        0            0        0\n"
-                 "llr              160        0        0            0        0");
+                 "llr              160        0        0            0        0\n"
+                 "situations: 23 of 130 met, in 1 block");
     EXPECT_EQ(messagesOf(checker), Messages());
+}
+
+/// The counts of a file of `num_pu,algorithm,situation,count`, by situation.
+std::map<std::string, std::uint64_t> countsOf(const std::string& file)
+{
+    std::map<std::string, std::uint64_t> counts;
+    std::istringstream lines(file);
+    for (std::string line; std::getline(lines, line);) {
+        const std::size_t last = line.rfind(',');
+        const std::size_t name = line.rfind(',', last - 1) + 1;
+        counts[line.substr(name, last - name)] = std::strtoull(line.c_str() + last + 1, nullptr, 10);
+    }
+    return counts;
+}
+
+TEST(Checker, CountsTheSituationsOfAllBlocks)
+{
+    const Checker checker = started(1);
+    EXPECT_EQ(countsOf(morvik_checker_situations(checker.get()))["blocks"], 0U);
+    for (int signal = 0; signal < MORVIK_CHECKER_SIGNALS; ++signal) {
+        observeAll(checker, signal);
+    }
+    auto first = countsOf(morvik_checker_situations(checker.get()));
+    EXPECT_EQ(first["blocks"], 1U);
+    EXPECT_EQ(first["pass.later.natural"], 40U);
+    EXPECT_GT(first["wrap.sum.above"], 0U);
+    ASSERT_EQ(start(checker, noisyBlock(1), 2), MORVIK_CHECKER_AGREES);
+    for (int signal = 0; signal < MORVIK_CHECKER_SIGNALS; ++signal) {
+        observeAll(checker, signal);
+    }
+    for (const auto& [name, count] : countsOf(morvik_checker_situations(checker.get()))) {
+        EXPECT_EQ(count, 2 * first[name]) << name;
+    }
+}
+
+TEST(Checker, CountsSituationsAtRightValuesAlone)
+{
+    const Checker checker = started(1);
+    const auto decided = [&checker] {
+        auto counts = countsOf(morvik_checker_situations(checker.get()));
+        return counts["decision.zero"] + counts["decision.one"] + counts["decision.none"];
+    };
+    EXPECT_EQ(decided(), 0U);
+    for (const int step : {3, 4}) {
+        morvik_checker_observe(checker.get(), MORVIK_CHECKER_LLR, 3, step, morvik_checker_ratio(checker.get(), step));
+    }
+    morvik_checker_observe(checker.get(), MORVIK_CHECKER_LLR, 3, 5, morvik_checker_ratio(checker.get(), 5) ^ 1);
+    EXPECT_EQ(decided(), 2U);
+    auto counts = countsOf(morvik_checker_situations(checker.get()));
+    EXPECT_EQ(counts["pass.later.natural"], 2U);
+    EXPECT_EQ(counts["segments.1"], 1U);
+    EXPECT_EQ(counts["branch.negated"], 0U);
+    EXPECT_EQ(counts["input.tail.highest"], 0U);
+}
+
+/// g3 is g0, and a test bench may observe either.
+TEST(Checker, CountsTheSituationsOfTwins)
+{
+    const Checker both[] = {started(1), started(1)};
+    observeAll(both[0], MORVIK_CHECKER_G);
+    observeAll(both[1], MORVIK_CHECKER_G + 3);
+    EXPECT_GT(countsOf(morvik_checker_situations(both[0].get()))["branch.g0.above"], 0U);
+    EXPECT_STREQ(morvik_checker_situations(both[0].get()), morvik_checker_situations(both[1].get()));
+}
+
+TEST(Checker, WritesSituations)
+{
+    const Checker checker = started(1);
+    observeAll(checker, MORVIK_CHECKER_LLR);
+    const TemporaryFolder folder;
+    EXPECT_EQ(morvik_checker_write_situations(checker.get(), folder.path("met.csv").c_str()), MORVIK_CHECKER_AGREES);
+    EXPECT_EQ(folder.read("met.csv"), morvik_checker_situations(checker.get()));
+    EXPECT_EQ(morvik_checker_write_situations(checker.get(), folder.path("no/met.csv").c_str()),
+              MORVIK_CHECKER_REFUSED);
+    EXPECT_EQ(morvik_checker_write_situations(checker.get(), nullptr), MORVIK_CHECKER_REFUSED);
+    const Messages messages = messagesOf(checker);
+    ASSERT_EQ(messages.size(), 2U);
+    EXPECT_TRUE(has(messages[0], "no/met.csv")) << messages[0];
+    EXPECT_EQ(messages[1], "ERROR:checker:The file name is a null pointer");
+    EXPECT_EQ(morvik_checker_write_situations(nullptr, "met.csv"), MORVIK_CHECKER_REFUSED);
+    EXPECT_STREQ(morvik_checker_situations(nullptr), "");
 }
 
 TEST(Checker, BeginsAnewWithEachBlock)

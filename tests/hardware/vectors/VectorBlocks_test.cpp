@@ -10,6 +10,7 @@
 #include "VectorSet.h"
 #include "hardware/vectors/Blocks.h"
 #include "hardware/vectors/Core.h"
+#include "hardware/vectors/Cover.h"
 #include "link/FrameSource.h"
 #include "support/PlainLink.h"
 
@@ -267,6 +268,46 @@ TEST(VectorBlocks, HaveTheTagsAroundTheLargest)
     EXPECT_EQ(edgeTags(8), (std::vector<std::uint32_t>{0, 1, 255, 256, 257, 0xFFFFFFFF}));
     EXPECT_EQ(edgeTags(1), (std::vector<std::uint32_t>{0, 1, 2, 3, 0xFFFFFFFF}));
     EXPECT_EQ(edgeTags(32), (std::vector<std::uint32_t>{0, 1, 0xFFFFFFFF}));
+}
+
+TEST(VectorBlocks, ThatAreDrawnMeetAllAndEachSomethingNew)
+{
+    Settings settings;
+    settings.cover = {"all"};
+    settings.iterations = 2;
+    morvik::vectors::Core core(settings);
+    morvik::coverage::Counts counts;
+    std::vector<Stimulus> kept;
+    cover(settings, core, counts, [&kept](const Stimulus& stimulus) { kept.push_back(stimulus); });
+    EXPECT_TRUE(uncovered(settings, counts).empty());
+    EXPECT_EQ(counts.blocks(), kept.size());
+    morvik::coverage::Counts sum;
+    for (const Stimulus& stimulus : kept) {
+        EXPECT_EQ(stimulus.name, "cover");
+        const std::size_t before = uncovered(settings, sum).size();
+        sum.add(core.situations(stimulus));
+        EXPECT_LT(uncovered(settings, sum).size(), before);
+    }
+    EXPECT_EQ(textOf(sum), textOf(counts));
+}
+
+TEST(VectorBlocks, AreDrawnOfTheSizesThatAreGiven)
+{
+    Settings settings = smallSet();
+    std::set<unsigned> sizes;
+    for (std::uint64_t number = 0; number < 24; ++number) {
+        const Stimulus stimulus = morvik::vectors::drawn(settings, number);
+        sizes.insert(stimulus.K);
+        for (const auto& stream : stimulus.streams) {
+            EXPECT_EQ(stream.size(), stimulus.K + 4);
+        }
+        settings.seed = 2;
+        EXPECT_NE(morvik::vectors::drawn(settings, number).streams, stimulus.streams) << number;
+        settings.seed = 1;
+    }
+    EXPECT_EQ(sizes, (std::set<unsigned>{40, 128}));
+    settings.blockSizes.clear();
+    EXPECT_EQ(coverSizes(settings), edgeSizes(2));
 }
 
 TEST(VectorBlocks, DifferBySeed)

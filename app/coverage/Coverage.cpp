@@ -1,0 +1,209 @@
+// Coverage: the subcommand that tells which situations of the arithmetic sets and simulations have met.
+#include "Coverage.h"
+
+#include <filesystem>
+#include <map>
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <vector>
+
+#include "Notice.h"
+#include "base/Error.h"
+#include "base/InputFile.h"
+#include "base/OutputFile.h"
+#include "base/Text.h"
+#include "hardware/coverage/Counts.h"
+#include "hardware/vectors/Set.h"
+#include "report/CoveragePage.h"
+#include "report/Page.h"
+#include "rules/Algorithms.h"
+
+namespace morvik {
+
+namespace {
+
+struct Options {
+    std::vector<std::string> inputs;
+    std::string output;
+    std::string report;
+    bool all = false;
+    bool json = false;
+    bool list = false;
+};
+
+std::string textOf(const coverage::Core& core)
+{
+    return std::to_string(core.units) + " units, " + std::string(rules::algorithmNames.at(core.algorithm));
+}
+
+std::string padded(std::string text, std::size_t width)
+{
+    text.resize(std::max(text.size(), width), ' ');
+    return text;
+}
+
+/// A line for a situation.
+std::string lineOf(const coverage::Situation& situation, const std::string& count)
+{
+    constexpr std::size_t widestRule = 3;
+    constexpr std::size_t widestName = 26;
+    constexpr std::size_t widestCount = 10;
+    return padded("", widestRule - std::to_string(situation.rule).size()) + std::to_string(situation.rule) + "  " +
+           padded(situation.name, widestName) + (count.empty() ? "" : padded(count, widestCount)) + situation.text +
+           '\n';
+}
+
+std::string listText()
+{
+    std::string text;
+    for (const coverage::Situation& each : coverage::situations()) {
+        text += lineOf(each, "");
+    }
+    return text;
+}
+
+/// How many situations cannot be met for each reason.
+std::string impossibleText(const coverage::Counts& counts)
+{
+    std::map<std::string, std::uint64_t> reasons;
+    for (unsigned number = 0; number < coverage::situations().size(); ++number) {
+        if (const auto why = counts.whyImpossible(number)) {
+            ++reasons[*why];
+        }
+    }
+    std::string text;
+    for (const auto& [reason, count] : reasons) {
+        text += "cannot occur: " + std::to_string(count) + ", as " + reason + '\n';
+    }
+    return text;
+}
+
+std::string textOf(const coverage::Counts& counts, bool all)
+{
+    std::string text;
+    for (const coverage::CoreCounts& each : counts.cores()) {
+        text += "core: " + textOf(each.core) + "; " + base::counted(each.blocks, "block") + '\n';
+    }
+    constexpr std::size_t none = 0;
+    text += "situations: " + coverage::summary(counts, none) + '\n';
+    for (unsigned number = 0; number < coverage::situations().size(); ++number) {
+        const bool isPossible = !counts.whyImpossible(number);
+        if (isPossible && (all || counts.met(number) == 0)) {
+            const std::string count = counts.met(number) == 0 ? "missing" : std::to_string(counts.met(number));
+            text += lineOf(coverage::situations()[number], count);
+        }
+    }
+    return text + impossibleText(counts);
+}
+
+std::string jsonOf(const coverage::Counts& counts)
+{
+    using Json = nlohmann::ordered_json;
+    Json cores = Json::array();
+    for (const coverage::CoreCounts& each : counts.cores()) {
+        cores.push_back({{"num_pu", each.core.units},
+                         {"algorithm", rules::algorithmNames.at(each.core.algorithm)},
+                         {"blocks", each.blocks}});
+    }
+    Json situations = Json::array();
+    for (unsigned number = 0; number < coverage::situations().size(); ++number) {
+        const coverage::Situation& each = coverage::situations()[number];
+        const auto why = counts.whyImpossible(number);
+        situations.push_back(
+            {{"name", each.name}, {"rule", each.rule}, {"text", each.text}, {"count", counts.met(number)}});
+        situations.back()["impossible"] = why ? Json(*why) : Json();
+    }
+    const Json object = {{"version", MORVIK_VERSION},
+                         {"cores", cores},
+                         {"missing", counts.missing().size()},
+                         {"situations", situations}};
+    return object.dump(2) + '\n';
+}
+
+void writePage(const std::string& fileName, const coverage::Counts& counts)
+{
+    report::CoverageDescription page;
+    page.lead = coverage::summary(counts, 0) + ", in " + base::counted(counts.blocks(), "block");
+    for (const coverage::CoreCounts& each : counts.cores()) {
+        page.cores.emplace_back(textOf(each.core), each.blocks);
+    }
+    for (unsigned number = 0; number < coverage::situations().size(); ++number) {
+        const coverage::Situation& each = coverage::situations()[number];
+        page.rows.push_back(
+            {each.rule, each.name, each.text, counts.met(number), counts.whyImpossible(number).value_or("")});
+    }
+    report::writeCoveragePage(fileName, page);
+}
+
+/// The counts of a file, or of a set of vectors.
+coverage::Counts countsOf(const std::string& input)
+{
+    if (std::filesystem::is_directory(input)) {
+        return vectors::situationsOf(input);
+    }
+    base::InputFile file(input);
+    return coverage::readCounts(file.stream(), file.name());
+}
+
+int run(const Options& options)
+{
+    if (options.list) {
+        print(listText());
+        return success;
+    }
+    if (options.inputs.empty()) {
+        throw base::Error("FILE is required; see 'morvik coverage --help'");
+    }
+    base::expectOwnFile(options.output, options.inputs, "counts");
+    if (!options.report.empty()) {
+        report::checkReport(options.report);
+        base::expectOwnFile(options.report, options.inputs, "results");
+    }
+    coverage::Counts counts;
+    for (const std::string& input : options.inputs) {
+        counts.add(countsOf(input));
+    }
+    if (!options.output.empty()) {
+        base::writeFile(options.output, coverage::textOf(counts));
+    }
+    if (!options.report.empty()) {
+        writePage(options.report, counts);
+    }
+    print(options.json ? jsonOf(counts) : textOf(counts, options.all));
+    return counts.missing().empty() ? success : differencesFound;
+}
+
+constexpr char explanation[] =
+    R"(A file is one that 'morvik vectors --coverage' or a checker in a simulator has written, or the folder
+of a set of vectors. All are summed. A situation counts as missing if one of the cores can meet it and
+none has. docs/coverage.md tells what the situations are.
+
+Exit status: 0 nothing is missing, 1 situations are missing, 2 bad input or usage.
+
+Example: a set that has all, and what one block alone meets
+  morvik vectors --out set --cover all
+  morvik vectors --out one --block-size 40 --blocks 1 --no-directed --coverage one.csv
+  morvik coverage one.csv --report one.html)";
+
+}  // namespace
+
+Command addCoverage(CLI::App& app)
+{
+    CLI::App* command =
+        app.add_subcommand("coverage", "Tell which situations of the arithmetic sets and simulations have met");
+    const auto options = std::make_shared<Options>();
+    command->add_option("FILE", options->inputs, "Counts, or folders of vectors")->type_name("");
+    command->add_option("--output", options->output, "Write the sums to this file, as CSV")->type_name("FILE");
+    command->add_option("--report", options->report, "Draw the sums as an HTML page")->type_name("FILE");
+    command->add_flag("--all", options->all, "Print the situations that have been met, too");
+    command->add_flag("--json", options->json, "Print a JSON object instead of text");
+    command->add_flag("--list", options->list, "Print all situations, and what they are, instead");
+    command->footer(explanation);
+    const auto work = [options] {
+        return run(*options);
+    };
+    return {command, work};
+}
+
+}  // namespace morvik
