@@ -1,7 +1,6 @@
 // Vectors: the subcommand that generates stimulus and expected values for a test bench.
 #include "Vectors.h"
 
-#include <filesystem>
 #include <memory>
 #include <optional>
 #include <string>
@@ -166,23 +165,10 @@ int make(Options options)
     return isCovered ? success : differencesFound;
 }
 
-/// All files that checking the set reads.
-std::vector<std::string> filesOf(const std::string& path, const vectors::Manifest& manifest)
-{
-    const std::filesystem::path folder = path;
-    std::vector<std::string> files = {folder / vectors::manifestName};
-    for (const vectors::ManifestFormat& format : manifest.formats) {
-        for (const vectors::ManifestFile& file : format.files) {
-            files.push_back(folder / file.name);
-        }
-    }
-    return files;
-}
-
 int check(const std::string& path)
 {
     const vectors::CheckedSet set = vectors::checkSet(path);
-    base::expectOwnFile(base::standardStream, filesOf(path, set.manifest), "findings");
+    base::expectOwnFile(base::standardStream, vectors::filesOf(path, set.manifest), "findings");
     const std::string opening =
         coreLine(set.manifest.settings.generics, set.manifest.settings.iterations) + base::visible(path) + ": ";
     if (set.difference) {

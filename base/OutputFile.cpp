@@ -284,4 +284,11 @@ bool isSamePlace(const std::string& a, const std::string& b)
     return place == whole(b) && place != "/dev/null";  // which keeps nothing
 }
 
+void expectDistinct(const std::string& file, const std::string& other)
+{
+    if (!file.empty() && !other.empty() && isSamePlace(file, other)) {
+        throw Error(file + ": is the same file as " + other + ", each output needs its own");
+    }
+}
+
 }  // namespace morvik::base

@@ -79,6 +79,9 @@ void expectOwnFile(const std::string& name, const std::vector<std::string>& inpu
 /// Whether writing one file would replace the other; /dev/null is nobody's loss. Throws Error if a link leads nowhere.
 bool isSamePlace(const std::string& a, const std::string& b);
 
+/// Throws Error if both outputs are given and writing one would replace the other.
+void expectDistinct(const std::string& file, const std::string& other);
+
 }  // namespace morvik::base
 
 #endif

@@ -79,14 +79,6 @@ std::string channelText(const std::vector<simulation::ResultRow>& rows)
                    : "Modulated symbols over white Gaussian noise, with the fading that is named";
 }
 
-/// Throws Error if both files are given and writing one would replace the other.
-void checkDistinct(const std::string& file, const std::string& other)
-{
-    if (!file.empty() && !other.empty() && base::isSamePlace(file, other)) {
-        throw base::Error(file + ": is the same file as " + other + ", each output needs its own");
-    }
-}
-
 }  // namespace
 
 void addPictureOptions(CLI::App& command, PictureOptions& options)
@@ -125,9 +117,9 @@ Pictures::Pictures(const PictureOptions& options, const std::string& output, std
     if (!options.report.empty()) {
         report::checkReport(options.report);
     }
-    checkDistinct(options.plot, output);
-    checkDistinct(options.report, output);
-    checkDistinct(options.report, options.plot);
+    base::expectDistinct(options.plot, output);
+    base::expectDistinct(options.report, output);
+    base::expectDistinct(options.report, options.plot);
 }
 
 void Pictures::takeAxis(simulation::Axis axis)

@@ -32,14 +32,15 @@ comparison::NameMap readMap(const std::string& file)
     return comparison::readNameMap(input.stream(), input.name());
 }
 
-/// Every file that is read and has a name of its own.
-std::vector<std::string> inputsOf(const CompareOptions& options)
+/// Results may not replace one another or what is read; compareSets() looks at the files of sets.
+void expectOwnResults(const CompareOptions& options)
 {
-    std::vector<std::string> files = {options.block, options.dump, options.map};
-    for (const std::string& set : options.sets) {
-        files.push_back(set + '/' + vectors::manifestName);
+    const std::vector<std::string> inputs = {options.block, options.dump, options.map};
+    base::expectOwnFile(base::standardStream, inputs, "reports");
+    for (const std::string& output : {options.json, options.junit}) {
+        base::expectOwnFile(output, inputs, "results");
     }
-    return files;
+    base::expectDistinct(options.json, options.junit);
 }
 
 ComparedSet compareBlock(const CompareOptions& options, const comparison::NameMap& map)
@@ -52,6 +53,7 @@ ComparedSet compareBlock(const CompareOptions& options, const comparison::NameMa
     readDump(options.dump, options.form, map, dump);
     return {options.block,
             coreText(generics, block.iterations),
+            {},
             {block},
             {compareCase(block, shownName(options.dump), dump, options)}};
 }
@@ -123,10 +125,7 @@ int compare(const CLI::App& command, const CompareOptions& options)
     if (!options.sets.empty()) {
         expectNoCoreBesideSet(command);
     }
-    base::expectOwnFile(base::standardStream, inputsOf(options), "reports");
-    for (const std::string& output : {options.json, options.junit}) {
-        base::expectOwnFile(output, inputsOf(options), "results");
-    }
+    expectOwnResults(options);
     const comparison::NameMap map = readMap(options.map);
     const std::vector<ComparedSet> sets =
         options.sets.empty() ? std::vector<ComparedSet>{compareBlock(options, map)} : compareSets(options, map);

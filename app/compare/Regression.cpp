@@ -11,6 +11,7 @@
 #include "DumpFiles.h"
 #include "Tasks.h"
 #include "base/Error.h"
+#include "base/OutputFile.h"
 #include "base/Text.h"
 #include "hardware/vectors/Manifest.h"
 #include "hardware/vectors/SetFolder.h"
@@ -60,6 +61,7 @@ ComparedSet readSet(const std::string& folder)
     vectors::BlockReader reader(folder, *tables::findFormat(manifest.formats.front().name), settings);
     ComparedSet set;
     set.folder = folder;
+    set.files = vectors::filesOf(folder, manifest);
     set.core = coreText(settings.generics, settings.iterations);
     vectors::Stimulus stimulus;
     vectors::Expected expected;
@@ -213,6 +215,31 @@ void compareEach(ComparedSet& set,
     }
 }
 
+/// Where the dumps of the set's blocks are.
+std::vector<std::string> dumpsOf(const ComparedSet& set, const CompareOptions& options)
+{
+    const std::string files = replaced(options.dump, setWord, set.folder);
+    std::vector<std::string> dumps = {files};
+    for (std::size_t block = 0; has(files, blockWord) && block < set.cases.size(); ++block) {
+        dumps.push_back(replaced(files, blockWord, std::to_string(block)));
+    }
+    return dumps;
+}
+
+/// Reads all sets before the first dump: an error in one is told at once, and results may replace nothing that is read.
+std::vector<ComparedSet> readSets(const CompareOptions& options)
+{
+    std::vector<ComparedSet> sets;
+    for (const std::string& folder : options.sets) {
+        const ComparedSet& set = sets.emplace_back(readSet(folder));
+        for (const std::string& output : {options.json, options.junit}) {
+            base::expectOwnFile(output, set.files, "results");
+            base::expectOwnFile(output, dumpsOf(set, options), "results");
+        }
+    }
+    return sets;
+}
+
 void keepSelected(ComparedSet& set, const CompareOptions& options)
 {
     if (!options.number) {
@@ -235,10 +262,9 @@ std::vector<ComparedSet> compareSets(const CompareOptions& options, const compar
     }
     const std::size_t threads =
         options.threads > 0 ? options.threads : std::max(std::thread::hardware_concurrency(), 1U);
-    std::vector<ComparedSet> sets;
-    for (const std::string& folder : options.sets) {
-        ComparedSet& set = sets.emplace_back(readSet(folder));
-        const std::string dump = replaced(options.dump, setWord, folder);
+    std::vector<ComparedSet> sets = readSets(options);
+    for (ComparedSet& set : sets) {
+        const std::string dump = replaced(options.dump, setWord, set.folder);
         (has(options.dump, blockWord) ? compareEach : compareTogether)(set, dump, options, map, threads);
         keepSelected(set, options);
     }

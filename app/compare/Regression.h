@@ -13,7 +13,8 @@ namespace morvik {
 /// A set of vectors whose dumps have been compared.
 struct ComparedSet {
     std::string folder;
-    std::string core;  ///< "2 units, scaled, 8 iterations"
+    std::string core;                ///< "2 units, scaled, 8 iterations"
+    std::vector<std::string> files;  ///< of the vectors
     std::vector<BlockCase> cases;
     std::vector<CaseResult> results;  ///< of the cases, in their order
 };

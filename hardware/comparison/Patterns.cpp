@@ -41,6 +41,12 @@ std::vector<Fault> sampleOf(const std::vector<Fault>& faults, std::size_t most)
     return some;
 }
 
+/// A right value is a fault, too, if the dump has other inputs of it than the core had. It is no mistake of the core.
+bool isWrong(const Model& model, const Fault& fault)
+{
+    return fault.got != model.values.at(fault.place);
+}
+
 /// Looks for what explains all values of a stage, wrong and right alike.
 class Explainer {
 public:
@@ -72,7 +78,7 @@ private:
     {
         std::vector<Fault> faults;
         for (Fault fault : itsComparison.faults) {
-            if (stageOf(fault.place.signal) == stage) {
+            if (stageOf(fault.place.signal) == stage && isWrong(itsModel, fault)) {
                 fault.wanted = itsComparison.inputsAreKnown ? fault.wanted : follows(fault.place).value;
                 if (fault.got != fault.wanted) {
                     faults.push_back(fault);
@@ -355,8 +361,9 @@ std::vector<Finding> findPatterns(const Model& model, const Values& dump, const 
     std::vector<Finding> findings;
     for (const Fault& each : comparison.faults) {
         const Stage stage = stageOf(each.place.signal);
-        if (std::none_of(
-                findings.begin(), findings.end(), [&](const Finding& known) { return known.stage == stage; })) {
+        const bool isKnown =
+            std::any_of(findings.begin(), findings.end(), [&](const Finding& known) { return known.stage == stage; });
+        if (!isKnown && isWrong(model, each)) {
             findings.push_back(explainer.explain(stage));
         }
     }

@@ -2,6 +2,7 @@
 #include "Manifest.h"
 
 #include <algorithm>
+#include <filesystem>
 
 #include "Received.h"
 #include "TransportJson.h"
@@ -284,6 +285,18 @@ Manifest readManifest(const std::string& fileName)
 {
     base::expectRegularFile(fileName);
     return parseManifest(base::readText(fileName), fileName);
+}
+
+std::vector<std::string> filesOf(const std::string& folder, const Manifest& manifest)
+{
+    const std::filesystem::path path = folder;
+    std::vector<std::string> files = {path / manifestName};
+    for (const ManifestFormat& format : manifest.formats) {
+        for (const ManifestFile& file : format.files) {
+            files.push_back(path / file.name);
+        }
+    }
+    return files;
 }
 
 }  // namespace morvik::vectors

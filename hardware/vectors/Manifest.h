@@ -55,6 +55,9 @@ Manifest parseManifest(const std::string& text, const std::string& fileName);
 /// Parses a manifest file.
 Manifest readManifest(const std::string& fileName);
 
+/// All files of a set, with their folder; the manifest is the first.
+std::vector<std::string> filesOf(const std::string& folder, const Manifest& manifest);
+
 }  // namespace morvik::vectors
 
 #endif

@@ -99,6 +99,8 @@ TEST_F(Compare, TellsAWrongRecordFromAWrongValue)
     EXPECT_EQ(result.status, 1);
     EXPECT_TRUE(has(result.out, "values: 1 difference\n")) << result.out;
     EXPECT_TRUE(has(result.out, "Where a fault is not a difference, the core had the right inputs")) << result.out;
+    EXPECT_TRUE(has(result.out, "Found in intrinsic values, 1 fault")) << result.out;
+    EXPECT_FALSE(has(result.out, "Found in branch metrics")) << result.out;  // which are right
 }
 
 TEST_F(Compare, FindsAFaultInAWaveform)

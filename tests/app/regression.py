@@ -179,6 +179,21 @@ class Regression(unittest.TestCase):
         result = self.run_morvik("compare", "--set", "played", "--dump", "player.fst")
         self.assertIn("2 blocks: 2 equal\n", result.stdout)
 
+    def test_results_replace_nothing_that_is_read(self):
+        folder = self.folder / "2_scaled"
+        (folder / "rtl_1.csv").write_text((folder / "rtl.csv").read_text())
+        arguments = ("compare", "--set", "2_scaled", "--dump")
+        for option in ("--json", "--junit"):
+            for dump, name in (("{set}/rtl.csv", "rtl.csv"), ("{set}/rtl_{block}.csv", "rtl_1.csv"),
+                               ("{set}/rtl.csv", "stimulus.csv"), ("{set}/rtl.csv", "manifest.json")):
+                before = (folder / name).read_bytes()
+                result = self.run_morvik(*arguments, dump, option, f"{folder}/{name}", status=2)
+                self.assertEqual(result.stderr, f"morvik compare: {folder}/{name}: is read as 2_scaled/{name}, results need a "
+                                                "file of their own\n")
+                self.assertEqual((folder / name).read_bytes(), before)
+        result = self.run_morvik(*arguments, "{set}/rtl.csv", "--json", "both", "--junit", "./both", status=2)
+        self.assertEqual(result.stderr, "morvik compare: both: is the same file as ./both, each output needs its own\n")
+
     def test_wrong_use_is_refused(self):
         for message, *arguments in (
                 ("either --block or --set is required; see 'morvik compare --help'",),
