@@ -15,6 +15,7 @@
 #include <utility>
 
 #include "Descriptor.h"
+#include "Printable.h"
 
 namespace morvik::base {
 
@@ -176,6 +177,15 @@ struct Pipe {
 };
 
 }  // namespace
+
+std::string Outcome::firstMessage() const
+{
+    const std::size_t first = err.find_first_not_of('\n');
+    if (first == std::string::npos) {
+        return "it failed without a message";
+    }
+    return visible(err.substr(first, err.find('\n', first) - first));
+}
 
 Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input)
 {

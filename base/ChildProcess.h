@@ -14,6 +14,9 @@ struct Outcome {
     bool succeeded;  // ended with exit status 0
     std::string out;
     std::string err;
+
+    /// The first line of its messages, with control characters visible, or that there is none.
+    std::string firstMessage() const;
 };
 
 /// Runs a program found through PATH, with `input` on its standard input, and waits for it to end. Throws

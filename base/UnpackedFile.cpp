@@ -1,13 +1,11 @@
 // UnpackedFile: opens files for reading, and unpacks them on the way.
 #include "UnpackedFile.h"
 
-#include <algorithm>
 #include <array>
 #include <system_error>
 #include <vector>
 
 #include "Error.h"
-#include "Printable.h"
 
 namespace morvik::base {
 
@@ -77,10 +75,8 @@ void UnpackedFile::expectWhole()
     }
     const Outcome outcome = itsProgram->wait();
     if (!outcome.succeeded) {
-        const std::string message =
-            outcome.err.substr(std::min(outcome.err.find_first_not_of('\n'), outcome.err.size()));
         throw Error(name() + ": cannot be unpacked by " + unpackerOf(itsPacking).command.front() + ": " +
-                    visible(message.substr(0, message.find('\n'))));
+                    outcome.firstMessage());
     }
 }
 

@@ -250,7 +250,7 @@ private:
         } else if (!isUnknownValue || namesItsPlace(of)) {
             named = namedPlace(of);
         }
-        return named ? itsDump->placeOf(itsFile.placeOf(*named, itsMap, itsDump->values), element) : std::nullopt;
+        return named ? itsDump->placeOf(itsFile.placeOf(*named, itsMap, itsDump->values, ""), element) : std::nullopt;
     }
 
     void take(std::string_view name, const Element& element, std::string_view text)

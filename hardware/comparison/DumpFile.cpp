@@ -48,20 +48,24 @@ std::int64_t DumpFile::integer(const std::string& what, std::string_view text) c
     return *value;
 }
 
-unsigned DumpFile::count(const std::string& what, std::int64_t number, unsigned first, unsigned count) const
+unsigned DumpFile::count(
+    const std::string& what, std::int64_t number, unsigned first, unsigned count, const std::string& whose) const
 {
     if (number < first || number - first >= count) {
-        fail(what + ' ' + base::shown(std::to_string(number)) + " is not allowed, expected an integer from " +
+        fail(what + ' ' + base::shown(std::to_string(number)) + whose + " is not allowed, expected an integer from " +
              std::to_string(first) + " to " + std::to_string(first + count - 1) +
              (first == 0 && number == count ? "; use a map if they count from 1" : ""));
     }
     return static_cast<unsigned>(number - first);
 }
 
-StepPlace DumpFile::placeOf(const NamedPlace& named, const NameMap& map, const Values& values) const
+StepPlace DumpFile::placeOf(const NamedPlace& named,
+                            const NameMap& map,
+                            const Values& values,
+                            const std::string& whose) const
 {
-    return {count("half-iteration", named.pass, map.firstPass, values.passes()),
-            count("step", named.step, map.firstStep, values.steps())};
+    return {count("half-iteration", named.pass, map.firstPass, values.passes(), whose),
+            count("step", named.step, map.firstStep, values.steps(), whose)};
 }
 
 Dump& DumpFile::dumpOf(std::string_view number, const NameMap& map, DumpSink& sink) const

@@ -31,10 +31,17 @@ public:
     std::int64_t integer(const std::string& what, std::string_view text) const;
 
     /// A number that counts from `first` as 0 to `count` - 1.
-    unsigned count(const std::string& what, std::int64_t number, unsigned first, unsigned count) const;
+    unsigned count(const std::string& what,
+                   std::int64_t number,
+                   unsigned first,
+                   unsigned count,
+                   const std::string& whose = "") const;
 
-    /// Checks a place that values of the dump belong to.
-    StepPlace placeOf(const NamedPlace& named, const NameMap& map, const Values& values) const;
+    /// Checks a place that values of the dump belong to. `whose` is empty or " of " and their name.
+    StepPlace placeOf(const NamedPlace& named,
+                      const NameMap& map,
+                      const Values& values,
+                      const std::string& whose) const;
 
     /// The dump of the block with this number as text.
     Dump& dumpOf(std::string_view number, const NameMap& map, DumpSink& sink) const;

@@ -205,6 +205,8 @@ private:
             const VcdGroup& each = groups[group];
             itsHistories.emplace_back(itsMap.timings[each.timing].delay);
             itsTicks.push_back(false);
+            itsOwners.push_back(
+                each.signals.empty() ? "" : " of " + itsScopes.pathOf(itsScopes.variables()[each.signals.front()]));
             for (const unsigned control : {each.pass, each.step, each.valid, each.clock, each.block}) {
                 if (control != nobody) {
                     itsDependents[control].push_back(group);
@@ -354,7 +356,7 @@ private:
         if (!named || (group.valid != nobody && valueOf(group.valid).value_or(0) != 1)) {
             return;
         }
-        const StepPlace place = itsFile.placeOf(*named, itsMap, itsDump->values);
+        const StepPlace place = itsFile.placeOf(*named, itsMap, itsDump->values, itsOwners[number]);
         for (const unsigned signal : group.signals) {
             if (const auto own = itsDump->placeOf(place, itsScopes.variables()[signal].element)) {
                 keepValue(signal, *own);
@@ -475,6 +477,7 @@ private:
     std::vector<std::vector<unsigned>> itsOfNet;           // variables to read
     std::vector<std::vector<unsigned>> itsDependents;      // groups that depend on a variable
     std::vector<PlaceHistory> itsHistories;                // of the groups
+    std::vector<std::string> itsOwners;                    // " of " and the first signal of each group
     std::vector<bool> itsTicks;                            // whether the clock of a group has risen
     std::vector<unsigned> itsChanged;                      // groups, since the last time
     std::vector<bool> itsHasChanged;

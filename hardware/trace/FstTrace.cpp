@@ -11,7 +11,6 @@
 #include "base/ChildProcess.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
-#include "base/Printable.h"
 
 namespace morvik::trace {
 
@@ -83,7 +82,7 @@ private:
                               error.code().message());
         }
         if (!outcome.succeeded) {
-            throw base::Error("vcd2fst cannot write the waveform: " + base::visible(outcome.err));
+            throw base::Error("vcd2fst cannot write the waveform: " + outcome.firstMessage());
         }
     }
 

@@ -73,6 +73,9 @@ TEST_F(Compare, ReadsPackedDumps)
     expectRefused(compareWith("part.fst"),
                   "part.fst: cannot be unpacked by fst2vcd: Could not open 'part.fst', exiting.");
     const std::string path = std::getenv("PATH");
+    ASSERT_EQ(shell("mkdir bin && printf '#!/bin/sh\\nexit 3\\n' >bin/fst2vcd && chmod +x bin/fst2vcd"), 0);
+    ASSERT_EQ(setenv("PATH", (morvik.directory() + "/bin:" + path).c_str(), 1), 0);
+    expectRefused(compareWith("trace.fst"), "trace.fst: cannot be unpacked by fst2vcd: it failed without a message");
     ASSERT_EQ(setenv("PATH", "/nowhere", 1), 0);
     const CommandResult withoutTool = compareWith("trace.fst");
     const CommandResult notWritten = morvik.run({"trace", "block.csv", "--format", "fst", "--output", "other.fst"});

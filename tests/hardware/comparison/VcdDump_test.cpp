@@ -353,7 +353,7 @@ TEST(VcdDump, NamesThePlaceOfAMistake)
     expectRefused(readVcd, "$upscope $end\n", "dump:1: $upscope outside of all scopes");
     expectRefused(readVcd,
                   start + pass + ratio + end + "#0\nb0 h\nb1111111 s\nb1 l\n",
-                  R"(dump:10: step "127" is not allowed, expected an integer from 0 to 42)");
+                  R"(dump:10: step "127" of core.llr is not allowed, expected an integer from 0 to 42)");
     expectRefused(readVcd,
                   start + pass + ratio + end + "#0\nb0 h\nb1 s\nb0111111111111111 l\n",
                   "dump:10: llr 32767 is not allowed, expected -2048 to 2047 eighths");
