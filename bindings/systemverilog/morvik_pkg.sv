@@ -302,18 +302,23 @@ package morvik_pkg;
             return morvik_checker_expected(handle, signal);
         endfunction
 
+        // How the block stands: CHECKER_AGREES, CHECKER_DIFFERS, CHECKER_INCOMPLETE, or CHECKER_REFUSED without a block.
+        function int standing();
+            return morvik_checker_standing(handle);
+        endfunction
+
         // Prints how much of the block was observed, and all differences. Returns CHECKER_AGREES, CHECKER_DIFFERS, or
         // CHECKER_INCOMPLETE after an error if values are missing. With `partial`, they may be.
         function int report(bit partial = 0);
-            int standing;
-            standing = morvik_checker_standing(handle);
+            int answer;
+            answer = standing();
             $display("%s", morvik_checker_report(handle));
-            if (standing == CHECKER_INCOMPLETE && partial)
-                standing = CHECKER_AGREES;
-            void'(answered(standing));
-            if (standing == CHECKER_INCOMPLETE)
+            if (answer == CHECKER_INCOMPLETE && partial)
+                answer = CHECKER_AGREES;
+            void'(answered(answer));
+            if (answer == CHECKER_INCOMPLETE)
                 add_message("ERROR:checker:Values are missing");
-            return standing;
+            return answer;
         endfunction
 
         // Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`. Returns
