@@ -19,6 +19,8 @@ constexpr double enoughDoublings = 1;
 constexpr double enoughByAmplitude = 3;
 /// Wrong signs that ratios promise for each wrong one: about one in noise, more if strong values are wrong.
 constexpr double contradictory = 1.3;
+/// Decibels below Shannon's limit at which nobody would look for mistakes.
+constexpr double hopeless = 6;
 constexpr std::size_t likelyAttempts = 6;
 constexpr std::size_t blocksTriedByCrc = 2;
 constexpr std::uint32_t simulatedBlocks = 100;
@@ -84,7 +86,12 @@ public:
             return diagnosis;
         }
         attemptAll(diagnosis);
-        tryScale(diagnosis);
+        measure(diagnosis);
+        dropNeedless(diagnosis);
+        dropDoubtful(diagnosis);
+        if (!diagnosis.nearest && !diagnosis.uneven) {
+            tryScale(diagnosis);
+        }
         judge(diagnosis);
         return diagnosis;
     }
@@ -131,6 +138,10 @@ private:
         bool isFound = false;
         for (ChainCase& each : itsCases) {
             each.sent = itsTrial.bitsOf(each, mistakes);
+            // The CRC of zeros fits: values without any order decode into them if their signs are chosen so.
+            if (mistakes.count(itsFormat) > 0 && std::count(each.sent.begin(), each.sent.end(), 0) == itsFormat.bits) {
+                each.sent.clear();
+            }
             isFound = isFound || !each.sent.empty();
         }
         return isFound;
@@ -224,15 +235,61 @@ private:
         return best;
     }
 
-    /// Tries a scale that is off by a power of two. It is a mistake if it keeps blocks from decoding.
-    void tryScale(ChainDiagnosis& diagnosis)
+    /// What the values say of their scale and of noise, once the likeliest mistakes are undone.
+    void measure(ChainDiagnosis& diagnosis) const
     {
-        diagnosis.strength = strengthOf(agreeingValues(itsFormat, itsCases, diagnosis.best.mistakes));
+        const std::vector<AgreeingValue> values = agreeingValues(itsFormat, itsCases, diagnosis.best.mistakes);
+        diagnosis.strength = strengthOf(values);
+        diagnosis.uneven = unevenPart(values, diagnosis.strength.unit);
         const double rate =
             static_cast<double>(itsFormat.bits) / itsFormat.codedBits / static_cast<double>(itsFormat.versions.size());
         diagnosis.suitableSteps =
             link::ratioScale(itsOptions.generics.C_ALGORITHM_TYPE, itsFormat.modulation, std::min(rate, 1.0));
         diagnosis.steps = itsScale * diagnosis.strength.unit;
+        diagnosis.isContradictory = diagnosis.strength.promised > contradictory * diagnosis.strength.wrong;
+    }
+
+    /// Drops single mistakes without which as many blocks decode, if noise does not explain what they leave.
+    void dropNeedless(ChainDiagnosis& diagnosis)
+    {
+        if (!diagnosis.uneven || diagnosis.best.decoded <= diagnosis.attempts.front().decoded) {
+            return;
+        }
+        for (bool isDropped = true; isDropped;) {
+            isDropped = false;
+            for (const ChainMistakes& fewer : withoutOne(diagnosis.best.mistakes, itsFormat)) {
+                const ChainAttempt tried = attempt(fewer, signsOf(agreeingValues(itsFormat, itsCases, fewer)));
+                if (tried.decoded >= diagnosis.best.decoded) {
+                    diagnosis.best = tried;
+                    diagnosis.attempts.push_back(tried);
+                    diagnosis.equals.clear();
+                    isDropped = true;
+                    break;
+                }
+            }
+        }
+        measure(diagnosis);
+    }
+
+    /// Drops mistakes that no block decodes without, if noise does not explain what they leave.
+    void dropDoubtful(ChainDiagnosis& diagnosis) const
+    {
+        const ChainAttempt& asIs = diagnosis.attempts.front();
+        if (diagnosis.best.mistakes.count(itsFormat) == 0 || diagnosis.best.decoded > asIs.decoded) {
+            return;
+        }
+        const NearMiss miss = {
+            diagnosis.best, esn0Of(itsFormat.modulation, diagnosis.best.signs.fraction()), limitOf(itsFormat)};
+        if (diagnosis.uneven || diagnosis.isContradictory || miss.esn0 < miss.limit - hopeless) {
+            diagnosis.nearest = miss;
+            diagnosis.best = asIs;
+            diagnosis.equals.clear();
+        }
+    }
+
+    /// Tries a scale that is off by a power of two. It is a mistake if it keeps blocks from decoding.
+    void tryScale(ChainDiagnosis& diagnosis)
+    {
         const double excess = diagnosis.steps > 0 ? diagnosis.steps / diagnosis.suitableSteps
                                                   : itsScale * diagnosis.strength.meanAmplitude / 8;
         if (diagnosis.best.signs.certainty() < related || excess <= 0) {
@@ -246,7 +303,8 @@ private:
         mistakes.doublings = static_cast<int>(std::lround(doublings));
         const ChainAttempt tried = attempt(mistakes, diagnosis.best.signs);
         diagnosis.attempts.push_back(tried);
-        if (tried.decoded > diagnosis.best.decoded) {
+        if (tried.decoded > diagnosis.best.decoded &&
+            (tried.decoded == diagnosis.blocks || !diagnosis.isContradictory)) {
             diagnosis.best = tried;
         }
     }
@@ -254,14 +312,14 @@ private:
     void judge(ChainDiagnosis& diagnosis)
     {
         const std::size_t asIs = diagnosis.attempts.front().decoded;
-        if (diagnosis.best.signs.certainty() < related) {
+        const Signs& signs = diagnosis.nearest ? diagnosis.nearest->attempt.signs : diagnosis.best.signs;
+        if (signs.certainty() < related) {
             diagnosis.verdict = Verdict::unrelated;
         } else if (asIs == diagnosis.blocks) {
             diagnosis.verdict = diagnosis.best.mistakes.count(itsFormat) > 0 ? Verdict::careless : Verdict::healthy;
         } else if (diagnosis.best.decoded == diagnosis.blocks) {
             diagnosis.verdict = Verdict::mistaken;
-        } else if (diagnosis.strength.promised > contradictory * diagnosis.strength.wrong) {
-            diagnosis.isContradictory = true;
+        } else if (diagnosis.nearest || diagnosis.uneven || diagnosis.isContradictory) {
             diagnosis.verdict = Verdict::unexplained;
         } else {
             ChainNoise noise;

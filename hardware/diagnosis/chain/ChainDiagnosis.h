@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "ChainEvidence.h"
+#include "ChainSpread.h"
 #include "hardware/diagnosis/Diagnosis.h"
 
 namespace morvik::diagnosis {
@@ -27,6 +28,14 @@ struct ChainNoise {
     std::uint32_t failed = 0;     ///< of them
 };
 
+/// Mistakes that explain many signs, but that no block decodes without, and beside which noise does not explain the
+/// rest.
+struct NearMiss {
+    ChainAttempt attempt;
+    double esn0 = 0;   ///< of noise that makes as many signs wrong,
+    double limit = 0;  ///< and below which nothing can be decoded: Shannon's limit; both in decibels
+};
+
 struct ChainDiagnosis {
     ChainFormat format;
     Verdict verdict = Verdict::healthy;  ///< all but `strange`
@@ -36,11 +45,13 @@ struct ChainDiagnosis {
     std::vector<ChainAttempt> attempts;  ///< as the blocks are, then the likeliest mistakes, the likeliest first
     ChainAttempt best;                   ///< with the mistakes that were found
     std::vector<ChainMistakes> equals;   ///< other mistakes, as many, that explain the signs as well
-    Strength strength;                   ///< of the values, once the mistakes are undone
-    double steps = 0;                    ///< of the core for a ratio of 1, or 0 if that is not known
-    double suitableSteps = 0;            ///< what suits instead
-    bool isContradictory = false;        ///< strong values are wrong too often for noise
-    std::optional<ChainNoise> noise;     ///< where blocks fail, and noise may be why
+    std::optional<NearMiss> nearest;     ///< if there is one, no mistake is found
+    std::optional<UnevenPart> uneven;  ///< where more signs are wrong than noise explains, if so, beside these mistakes
+    Strength strength;                 ///< of the values, once the mistakes are undone
+    double steps = 0;                  ///< of the core for a ratio of 1, or 0 if that is not known
+    double suitableSteps = 0;          ///< what suits instead
+    bool isContradictory = false;      ///< strong values are wrong too often for noise
+    std::optional<ChainNoise> noise;   ///< where blocks fail, and noise may be why
 };
 
 /// Looks for mistakes that explain the cases, of which there must be at least one. `scale` is the core's steps for a

@@ -251,15 +251,15 @@ ChainSuspicion ChainEvidence::withBuffer(const ChainSuspicion& suspicion) const
     return judged(tally, weightOf(suspicion.signs));
 }
 
-std::vector<float> agreeingValues(const ChainFormat& format,
-                                  const std::vector<ChainCase>& cases,
-                                  const ChainMistakes& mistakes)
+std::vector<AgreeingValue> agreeingValues(const ChainFormat& format,
+                                          const std::vector<ChainCase>& cases,
+                                          const ChainMistakes& mistakes)
 {
     const link::TransportBlockCode code(codingOf(format));
     const link::CodeBlocks& blocks = code.blocks();
     const std::vector<Part> parts = partsOf(code, mistakes.split);
     const std::vector<unsigned>& versions = mistakes.versions.empty() ? format.versions : mistakes.versions;
-    std::vector<float> values;
+    std::vector<AgreeingValue> values;
     for (const ChainCase& each : cases) {
         if (each.sent.empty() || values.size() >= enoughValues) {
             continue;
@@ -268,11 +268,15 @@ std::vector<float> agreeingValues(const ChainFormat& format,
         for (unsigned r = 0; r < blocks.count; ++r) {
             const WholeBuffer whole(blocks.size(r), blocks.fillersOf(r), mistakes);
             const CircularBuffer buffer = whole.limited(bufferSizeOf(format, mistakes, blocks.count, whole.size()));
-            for (std::size_t t = 0; t < each.rows.size() && !buffer.places.empty(); ++t) {
+            const unsigned length = blocks.size(r) + rules::tailPositions;
+            for (unsigned t = 0; t < each.rows.size() && !buffer.places.empty(); ++t) {
                 const std::vector<float> row = restoredSymbols(each.rows[t], format.modulation, mistakes);
-                for (std::size_t i = 0; i < parts[r].count; ++i) {
-                    const std::size_t place = (buffer.starts.at(versions[t]) + i) % buffer.places.size();
-                    values.push_back(row[parts[r].first + i] * static_cast<float>(words[r][buffer.places[place]]));
+                for (unsigned i = 0; i < parts[r].count; ++i) {
+                    const unsigned bit = buffer.places[(buffer.starts.at(versions[t]) + i) % buffer.places.size()];
+                    const auto eighth = static_cast<unsigned>(std::uint64_t{8} * i / parts[r].count);
+                    const float value = row[parts[r].first + i] * static_cast<float>(words[r][bit]);
+                    const unsigned stream = bit % length < blocks.size(r) ? bit / length : 3;
+                    values.push_back({value, stream, t, r, i % bitsPerSymbol(format.modulation), eighth});
                 }
             }
         }
@@ -280,22 +284,22 @@ std::vector<float> agreeingValues(const ChainFormat& format,
     return values;
 }
 
-Strength strengthOf(const std::vector<float>& values)
+Strength strengthOf(const std::vector<AgreeingValue>& values)
 {
     constexpr std::ptrdiff_t fewest = 20;
     Strength strength;
-    for (const float value : values) {
-        strength.meanAmplitude += std::abs(static_cast<double>(value)) / static_cast<double>(values.size());
+    for (const AgreeingValue& each : values) {
+        strength.meanAmplitude += std::abs(static_cast<double>(each.value)) / static_cast<double>(values.size());
     }
-    const auto wrong = std::count_if(values.begin(), values.end(), [](float value) { return value < 0; });
+    const auto wrong = std::count_if(values.begin(), values.end(), [](const auto& each) { return each.value < 0; });
     if (wrong < fewest || strength.meanAmplitude <= 0) {
         return strength;
     }
     // A ratio x is wrong with probability 1 / (1 + e^x): the factor that makes the values ratios is the likeliest one.
     const auto slope = [&values](double factor) {
         double sum = 0;
-        for (const float value : values) {
-            sum += value / (1 + std::exp(factor * value));
+        for (const AgreeingValue& each : values) {
+            sum += each.value / (1 + std::exp(factor * each.value));
         }
         return sum;
     };
@@ -308,8 +312,8 @@ Strength strengthOf(const std::vector<float>& values)
     }
     strength.unit = 1 / low;
     strength.wrong = static_cast<double>(wrong) / static_cast<double>(values.size());
-    for (const float value : values) {
-        strength.promised += 1 / (1 + std::exp(low * std::abs(value))) / static_cast<double>(values.size());
+    for (const AgreeingValue& each : values) {
+        strength.promised += 1 / (1 + std::exp(low * std::abs(each.value))) / static_cast<double>(values.size());
     }
     return strength;
 }

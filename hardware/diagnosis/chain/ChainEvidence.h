@@ -79,13 +79,23 @@ struct Strength {
     double promised = 0;  ///< and what the ratios promise, which is as many in any noise
 };
 
-/// The sent value of each received one: the value, negated where its bit is 0, with the mistakes undone.
-std::vector<float> agreeingValues(const ChainFormat& format,
-                                  const std::vector<ChainCase>& cases,
-                                  const ChainMistakes& mistakes);
+/// A received value, negated where its bit is 0, and which bit that is.
+struct AgreeingValue {
+    float value;
+    unsigned stream;  ///< 0 to 2, or 3 for the tail
+    unsigned transmission;
+    unsigned codeBlock;
+    unsigned symbolBit;  ///< its place in the symbol, 0 to 7
+    unsigned eighth;     ///< of the code block's values in the transmission, 0 to 7
+};
+
+/// The received values with the mistakes undone.
+std::vector<AgreeingValue> agreeingValues(const ChainFormat& format,
+                                          const std::vector<ChainCase>& cases,
+                                          const ChainMistakes& mistakes);
 
 /// The strength of such values.
-Strength strengthOf(const std::vector<float>& values);
+Strength strengthOf(const std::vector<AgreeingValue>& values);
 
 }  // namespace morvik::diagnosis
 

@@ -321,6 +321,35 @@ ChainMistakes joined(ChainMistakes one, const ChainMistakes& other)
     return one;
 }
 
+std::vector<ChainMistakes> withoutOne(const ChainMistakes& mistakes, const ChainFormat& format)
+{
+    std::vector<ChainMistakes> fewer;
+    const auto add = [&](const auto& put) {
+        ChainMistakes one = mistakes;
+        put(one);
+        if (one.count(format) < mistakes.count(format)) {
+            fewer.push_back(one);
+        }
+    };
+    for (std::size_t t = 0; t < mistakes.versions.size(); ++t) {
+        add([&](ChainMistakes& one) { one.versions[t] = format.versions[t]; });
+    }
+    const ChainMistakes none;
+    const auto addWithout = [&](auto... members) {
+        (add([&](ChainMistakes& one) { one.*members = none.*members; }), ...);
+    };
+    addWithout(&ChainMistakes::bufferSize,
+               &ChainMistakes::fillersSent,
+               &ChainMistakes::interleaver,
+               &ChainMistakes::buffer,
+               &ChainMistakes::noOffset,
+               &ChainMistakes::split,
+               &ChainMistakes::symbol,
+               &ChainMistakes::flip,
+               &ChainMistakes::doublings);
+    return fewer;
+}
+
 std::vector<ChainMistakes> combinationsOf(const std::vector<std::vector<ChainMistakes>>& kinds, bool inPairs)
 {
     std::vector<ChainMistakes> all;

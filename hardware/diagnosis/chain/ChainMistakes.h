@@ -99,6 +99,9 @@ std::vector<std::vector<ChainMistakes>> kindsOfMistakes(const ChainFormat& forma
 /// Both.
 ChainMistakes joined(ChainMistakes one, const ChainMistakes& other);
 
+/// The mistakes with one less: without each of them in turn.
+std::vector<ChainMistakes> withoutOne(const ChainMistakes& mistakes, const ChainFormat& format);
+
 /// Each mistake of these kinds by itself, or each two of different kinds.
 std::vector<ChainMistakes> combinationsOf(const std::vector<std::vector<ChainMistakes>>& kinds, bool inPairs);
 

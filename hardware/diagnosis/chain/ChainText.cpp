@@ -27,14 +27,15 @@ std::string row(const ChainAttempt& attempt, const ChainDiagnosis& diagnosis)
            rightAligned(percent(attempt.signs), 13) + "  " + listed(attempt.mistakes, diagnosis.format) + '\n';
 }
 
-/// The attempt without changes, the best one, and the likeliest others with no more mistakes.
+/// The attempt without changes, the best or nearest one, and the likeliest others with no more mistakes.
 std::string table(const ChainDiagnosis& diagnosis)
 {
+    const ChainAttempt& likeliest = diagnosis.nearest ? diagnosis.nearest->attempt : diagnosis.best;
     constexpr std::size_t most = 4;
     std::string text =
         "  decoded  wrong bits  wrong signs  mistakes undone\n" + row(diagnosis.attempts.front(), diagnosis);
-    const std::string best = row(diagnosis.best, diagnosis);
-    const unsigned count = diagnosis.best.mistakes.count(diagnosis.format);
+    const std::string best = row(likeliest, diagnosis);
+    const unsigned count = likeliest.mistakes.count(diagnosis.format);
     text += count > 0 ? best : "";
     std::size_t shown = 0;
     for (std::size_t i = 1; i < diagnosis.attempts.size() && diagnosis.verdict != Verdict::healthy; ++i) {
@@ -60,6 +61,30 @@ std::string foundText(const ChainDiagnosis& diagnosis)
     return text;
 }
 
+/// What noise alone does not do to signs.
+std::string doubtText(const ChainDiagnosis& diagnosis)
+{
+    if (diagnosis.uneven) {
+        return percent(diagnosis.uneven->inside) + " of the signs are wrong in " + diagnosis.uneven->name + ", " +
+               percent(diagnosis.uneven->others) + " elsewhere";
+    }
+    if (diagnosis.isContradictory) {
+        return "strong values are wrong too often for noise";
+    }
+    return "signs are as wrong as in noise at Es/N0 = " + fixed(diagnosis.nearest->esn0, 1) + " dB, " +
+           fixed(diagnosis.nearest->limit - diagnosis.nearest->esn0, 1) + " dB below Shannon's limit";
+}
+
+std::string unexplainedText(const ChainDiagnosis& diagnosis)
+{
+    if (diagnosis.nearest) {
+        return ", and no known mistake explains it.\nNearest: " +
+               listed(diagnosis.nearest->attempt.mistakes, diagnosis.format) + ". But then " + doubtText(diagnosis) +
+               ".\n";
+    }
+    return ", and " + doubtText(diagnosis) + ". Is there another order of bits or symbols, or a burst?\n";
+}
+
 std::string verdictText(const ChainDiagnosis& diagnosis)
 {
     const bool isMistaken = diagnosis.best.mistakes.count(diagnosis.format) > 0;
@@ -82,10 +107,8 @@ std::string verdictText(const ChainDiagnosis& diagnosis)
         return "Too noisy: " + failures + (isMistaken ? " even then" : ", and no mistake explains it") + ".\n" +
                noiseText();
     case Verdict::unexplained:
-        if (diagnosis.isContradictory) {
-            return "Not explained: " + failures + (isMistaken ? " even then" : "") +
-                   ", and strong values are wrong too often for noise. Is there another order of bits or symbols, or a "
-                   "burst?\n";
+        if (!diagnosis.noise) {
+            return "Not explained: " + failures + (isMistaken ? " even then" : "") + unexplainedText(diagnosis);
         }
         return "Not explained: " + failures + (isMistaken ? " even then" : " for another reason") +
                ", which noise of this strength hardly ever causes.\n" + noiseText();
@@ -101,7 +124,7 @@ std::string verdictText(const ChainDiagnosis& diagnosis)
 
 std::string scaleText(const ChainDiagnosis& diagnosis)
 {
-    if (diagnosis.isContradictory) {
+    if (diagnosis.verdict == Verdict::unexplained && !diagnosis.noise) {
         return "";
     }
     if (diagnosis.steps <= 0) {
@@ -158,6 +181,14 @@ std::string jsonOf(const ChainDiagnosis& diagnosis)
         {"suitable_steps", diagnosis.suitableSteps}};
     for (const ChainMistakes& equal : diagnosis.equals) {
         object["or"].push_back(mistakesOf(equal, diagnosis.format));
+    }
+    if (diagnosis.nearest) {
+        object["nearest"] = mistakesOf(diagnosis.nearest->attempt.mistakes, diagnosis.format);
+    }
+    if (diagnosis.uneven) {
+        object["uneven"] = {{"part", diagnosis.uneven->name},
+                            {"wrong_signs", diagnosis.uneven->inside.fraction()},
+                            {"other_wrong_signs", diagnosis.uneven->others.fraction()}};
     }
     if (diagnosis.noise) {
         object["noise"] = {{"esn0_db", diagnosis.noise->esn0},

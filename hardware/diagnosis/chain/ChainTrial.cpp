@@ -12,6 +12,21 @@
 
 namespace morvik::diagnosis {
 
+namespace {
+
+simulation::LinkFormat linkFormatOf(const ChainFormat& format)
+{
+    simulation::LinkFormat sent;
+    sent.transportBlockSize = format.bits;
+    sent.codedBits = format.codedBits;
+    sent.modulation = format.modulation;
+    sent.versions = format.versions;
+    sent.softBufferSize = format.softBufferSize == link::unlimitedBuffer ? 0 : format.softBufferSize;
+    return sent;
+}
+
+}  // namespace
+
 ChainTrial::ChainTrial(const ChainFormat& format, const DecoderOptions& options, double scale)
     : itsFormat(format),
       itsCode(codingOf(format)),
@@ -140,17 +155,16 @@ double esn0Of(link::Modulation modulation, double wrongSigns)
     return high / 1000.0;
 }
 
+double limitOf(const ChainFormat& format)
+{
+    return simulation::usualMilliEsn0(linkFormatOf(format), link::codeBlocksOf(format.bits).sizePlus).front() / 1000.0;
+}
+
 std::uint32_t simulatedFailures(
     const ChainFormat& format, const DecoderOptions& options, double esn0, double stepsPerRatio, std::uint32_t blocks)
 {
     simulation::Sweep sweep;
-    simulation::LinkFormat sent;
-    sent.transportBlockSize = format.bits;
-    sent.codedBits = format.codedBits;
-    sent.modulation = format.modulation;
-    sent.versions = format.versions;
-    sent.softBufferSize = format.softBufferSize == link::unlimitedBuffer ? 0 : format.softBufferSize;
-    sweep.formats = {sent};
+    sweep.formats = {linkFormatOf(format)};
     sweep.numPus = {static_cast<unsigned>(options.generics.C_NUM_PU)};
     sweep.algorithms = {static_cast<unsigned>(options.generics.C_ALGORITHM_TYPE)};
     const auto milliScale = static_cast<int>(std::lround(std::min(1000 * stepsPerRatio, 1e6)));

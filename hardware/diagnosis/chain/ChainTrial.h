@@ -56,6 +56,9 @@ private:
 /// The Es/N0 of white Gaussian noise, in decibels, that makes a fraction of the signs wrong.
 double esn0Of(link::Modulation modulation, double wrongSigns);
 
+/// The Es/N0 below which nothing can be decoded: Shannon's limit for all transmissions together, in decibels.
+double limitOf(const ChainFormat& format);
+
 /// How many of `blocks` transport blocks of the format fail at an Es/N0. `stepsPerRatio` is the core's steps for a
 /// log-likelihood ratio of 1; 0 takes what suits.
 std::uint32_t simulatedFailures(
