@@ -358,7 +358,7 @@ def flow():
 
     left = lanes.stations(top, ("Blocks are cut, loaded and clipped", "src/LanePath.cpp: take, prepare, load",
                                 "rules/Cut.h: segmentCount, windowStart"),
-                          ("A slice for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareInterleaver",
+                          ("A slice for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareWork", "lanes/SizeTables.cpp: write",
                            "lanes/Transpose.h: fillSlices"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
                            "lanes/Kernels.cpp: decode, runPasses"),

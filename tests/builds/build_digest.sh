@@ -11,5 +11,5 @@ trap 'rm -rf "$work"' EXIT
 
 "${compile[@]}" -DMORVIK_LANES=generic -DMORVIK_LANES_NAME='"generic"' -c "$root/lanes/Kernels.cpp" -o "$work/kernels.o"
 "${compile[@]}" -DMORVIK_LANES_ONLY_GENERIC -DMORVIK_VERSION='""' "$root"/src/*.cpp \
-    "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$tests/support/Blocks.cpp" "$tests/builds/digest.cpp" \
-    "$work/kernels.o" -o "$program"
+    "$root/lanes/InstructionSets.cpp" "$root/lanes/LaneDecoder.cpp" "$root/lanes/SizeTables.cpp" \
+    "$tests/support/Blocks.cpp" "$tests/builds/digest.cpp" "$work/kernels.o" -o "$program"
