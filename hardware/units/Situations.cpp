@@ -6,7 +6,7 @@
 #include <utility>
 
 #include "Units.h"
-#include "Watched.h"
+#include "Watching.h"
 #include "rules/Algorithms.h"
 
 namespace morvik::units {
@@ -140,15 +140,10 @@ void countStep(bool isForward, int algorithm, const std::vector<std::int32_t>& i
 {
     Watch watch;
     const Column from = {rowAt<Metrics>(inputs, 0), rowAt<Metrics>(inputs, states)};
-    const auto word = [&](std::int32_t eighths) {
-        return Watched{aligned(eighths), &watch};
-    };
-    const auto branchWord = [&](std::int32_t eighths) {
-        return Watched{aligned(eighths), &watch, true};
-    };
-    const auto g = wordsOf<Watched>(rowAt<Branches>(inputs, std::size_t{2} * states), branchWord);
-    advanced<Watched>(algorithm, from, word, [&](const auto& rule, const auto& column) {
-        return isForward ? rules::forwardStep(rule, column, g) : rules::backwardStep(rule, column, g);
+    const auto g = wordsOf(rowAt<Branches>(inputs, std::size_t{2} * states));
+    advanced(algorithm, from, [&](const auto& rule, const auto& column) {
+        const Watching watching(rule, watch);
+        return isForward ? rules::forwardStep(watching, column, g) : rules::backwardStep(watching, column, g);
     });
     countDecisions(watch, false, algorithm, all);
     all.back().counts[0] += watch.sumWraps ? 1U : 0U;
@@ -157,19 +152,19 @@ void countStep(bool isForward, int algorithm, const std::vector<std::int32_t>& i
 void countRatio(int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
 {
     Watch watch;
-    const auto word = [&](std::int32_t eighths) {
-        return Watched{aligned(eighths), &watch};
-    };
-    const auto branchWord = [&](std::int32_t eighths) {
-        return Watched{aligned(eighths), &watch, true};
-    };
-    const auto alpha = wordsOf<Watched>(rowAt<Metrics>(inputs, 0), word);
-    const auto beta = wordsOf<Watched>(rowAt<Metrics>(inputs, states), word);
-    const auto g = wordsOf<Watched>(rowAt<Branches>(inputs, std::size_t{2} * states), branchWord);
-    const std::int32_t difference = withRule<Watched>(algorithm, [&](const auto& rule) {
-        const std::int32_t one = rules::bestPath<1>(rule, alpha, beta, g).value;
-        return one - rules::bestPath<0>(rule, alpha, beta, g).value;
+    const auto alpha = wordsOf(rowAt<Metrics>(inputs, 0));
+    const auto beta = wordsOf(rowAt<Metrics>(inputs, states));
+    const auto g = wordsOf(rowAt<Branches>(inputs, std::size_t{2} * states));
+    const std::int32_t difference = withRule(algorithm, [&](const auto& rule) {
+        const Watching watching(rule, watch);
+        const std::int32_t one = rules::bestPath<1>(watching, alpha, beta, g);
+        return one - rules::bestPath<0>(watching, alpha, beta, g);
     });
+    for (unsigned state = 0; state < states; ++state) {
+        for (const unsigned bit : {0U, 1U}) {
+            watch.addSum(std::int32_t{alpha[state]} + beta[rules::successor(state, bit)]);
+        }
+    }
     countDecisions(watch, true, algorithm, all);
     all[all.size() - 2].counts[0] += watch.sumWraps ? 1U : 0U;
     all.back().counts[0] += rules::wrap16(difference) != difference ? 1U : 0U;

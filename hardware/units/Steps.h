@@ -1,4 +1,4 @@
-// Steps: the steps of rules/Trellis.h on integers in eighths, over any value type that stands for a word.
+// Steps: the steps of rules/Trellis.h on integers in eighths.
 #ifndef MORVIK_HARDWARE_UNITS_STEPS_H
 #define MORVIK_HARDWARE_UNITS_STEPS_H
 
@@ -7,9 +7,9 @@
 #include <type_traits>
 
 #include "Units.h"
-#include "hardware/comparison/Decisions.h"
 #include "hardware/testbench/Corrections.h"
 #include "rules/Formats.h"
+#include "rules/TrellisDecision.h"
 
 namespace morvik::units {
 
@@ -25,65 +25,83 @@ constexpr std::int32_t eighthsOf(rules::Value word)
     return rules::integerOf(word, rules::stateAlignment);
 }
 
+/// The corrections of the table, by the difference of two candidates (rule 9).
+struct Table {
+    const unsigned char* middle;
+
+    rules::Value operator()(rules::Value difference) const
+    {
+        return middle[difference];
+    }
+};
+
 /// Calls use(rule) with the decision rule of an algorithm type.
-template <class Word, class Use>
+template <class Use>
 auto withRule(int algorithm, Use use)
 {
-    using Table = comparison::Corrections<Word>;
-    return algorithm == tableAlgorithm ? use(rules::DecideMaxHash<Word, Table>(Table{corrections()}))
-                                       : use(rules::DecideMax<Word>());
+    return algorithm == tableAlgorithm ? use(rules::DecideMaxHash<rules::Value, Table>(Table{corrections()}))
+                                       : use(rules::DecideMax<rules::Value>());
 }
 
-template <class Word>
-void take(Word& metric, Word value, Word /*pending*/)
+constexpr rules::Value valueOf(rules::Value metric)
+{
+    return metric;
+}
+
+constexpr rules::Value pendingOf(rules::Value /*metric*/)
+{
+    return 0;
+}
+
+constexpr void take(rules::Value& metric, rules::Value value, rules::Value /*pending*/)
 {
     metric = value;
 }
 
-template <class Word>
-void take(rules::PendingMetric<Word>& metric, Word value, Word pending)
+using PendingMetric = rules::PendingMetric<rules::Value>;
+
+constexpr rules::Value valueOf(const PendingMetric& metric)
 {
-    metric = {value, pending};
+    return metric.value;
 }
 
-template <class Word>
-Word pendingOf(const Word& /*metric*/)
-{
-    return Word{};
-}
-
-template <class Word>
-Word pendingOf(const rules::PendingMetric<Word>& metric)
+constexpr rules::Value pendingOf(const PendingMetric& metric)
 {
     return metric.pending;
 }
 
-/// Takes a column through advance(rule, column): a step of a recursion. wordOf(eighths) makes a word of a metric.
-template <class Word, class WordOf, class Advance>
-Column advanced(int algorithm, const Column& from, WordOf word, Advance advance)
+constexpr void take(PendingMetric& metric, rules::Value value, rules::Value pending)
 {
-    using comparison::wordOf;
-    return withRule<Word>(algorithm, [&](const auto& rule) {
+    metric = {value, pending};
+}
+
+/// Takes a column through advance(rule, column): a step of a recursion.
+template <class Advance>
+Column advanced(int algorithm, const Column& from, Advance advance)
+{
+    return withRule(algorithm, [&](const auto& rule) {
         rules::Column<std::decay_t<decltype(rule)>> column{};
         for (std::size_t state = 0; state < column.size(); ++state) {
-            take(column[state], word(from.metrics[state]), word(from.pending[state]));
+            take(column[state], aligned(from.metrics[state]), aligned(from.pending[state]));
         }
         column = advance(rule, column);
         Column reached;
         for (std::size_t state = 0; state < column.size(); ++state) {
-            reached.metrics[state] = eighthsOf(wordOf(rule.stored(column[state])));
-            reached.pending[state] = eighthsOf(wordOf(pendingOf(column[state])));
+            reached.metrics[state] = eighthsOf(valueOf(column[state]));
+            reached.pending[state] = eighthsOf(pendingOf(column[state]));
         }
         return reached;
     });
 }
 
-template <class Word, std::size_t count, class WordOf>
-std::array<Word, count> wordsOf(const std::array<std::int32_t, count>& eighths, WordOf word)
+/// The words of a row, by a function that makes one of a number.
+template <std::size_t count>
+std::array<rules::Value, count> wordsOf(const std::array<std::int32_t, count>& row,
+                                        rules::Value (*wordOf)(std::int32_t) = aligned)
 {
-    std::array<Word, count> words{};
+    std::array<rules::Value, count> words{};
     for (std::size_t i = 0; i < count; ++i) {
-        words[i] = word(eighths[i]);
+        words[i] = wordOf(row[i]);
     }
     return words;
 }

@@ -52,23 +52,22 @@ Branches branchMetrics(std::int32_t twiceIntrinsic, std::int32_t parity)
 
 Column forward(int algorithm, const Column& before, const Branches& g)
 {
-    return advanced<Value>(algorithm, before, aligned, [&](const auto& rule, const auto& column) {
-        return rules::forwardStep(rule, column, wordsOf<Value>(g, aligned));
+    return advanced(algorithm, before, [&](const auto& rule, const auto& column) {
+        return rules::forwardStep(rule, column, wordsOf(g));
     });
 }
 
 Column backward(int algorithm, const Column& behind, const Branches& g)
 {
-    return advanced<Value>(algorithm, behind, aligned, [&](const auto& rule, const auto& column) {
-        return rules::backwardStep(rule, column, wordsOf<Value>(g, aligned));
+    return advanced(algorithm, behind, [&](const auto& rule, const auto& column) {
+        return rules::backwardStep(rule, column, wordsOf(g));
     });
 }
 
 std::int32_t ratio(int algorithm, const Metrics& alpha, const Metrics& beta, const Branches& g)
 {
-    return withRule<Value>(algorithm, [&](const auto& rule) {
-        return eighthsOf(rules::logLikelihoodRatio(
-            rule, wordsOf<Value>(alpha, aligned), wordsOf<Value>(beta, aligned), wordsOf<Value>(g, aligned)));
+    return withRule(algorithm, [&](const auto& rule) {
+        return eighthsOf(rules::logLikelihoodRatio(rule, wordsOf(alpha), wordsOf(beta), wordsOf(g)));
     });
 }
 
@@ -100,12 +99,12 @@ Metrics tail(const TailValues& systematic, const TailValues& parity)
         values.p[step] = wide(parity[step]);
     }
     const auto sums = rules::tailColumn(values);
-    return masked(wordsOf<Value>(sums, rules::wrap16));
+    return masked(wordsOf(sums, rules::wrap16));
 }
 
 Metrics border(const Metrics& column)
 {
-    return masked(wordsOf<Value>(column, aligned));
+    return masked(wordsOf(column));
 }
 
 }  // namespace morvik::units
