@@ -138,6 +138,12 @@ constexpr std::array<NamedMistake, 9> extrinsicMistakes = {{
     {{Mistake::ratioMisread, AddressError{AddressError::behind}}, "the ratio is that of the step after (rule 14)"},
 }};
 
+/// Memories of which all cells or some do not answer.
+constexpr std::array<NamedMistake, 2> deadMemories = {{
+    {Mistake::forwardMissing, "forward metrics read as zeros (rule 8)"},
+    {Mistake::backwardMissing, "backward metrics read as zeros (rule 8)"},
+}};
+
 /// Mistakes in handing on border columns, except their mask.
 constexpr std::array<NamedMistake, 10> borderMistakes = {{
     {Mistake::borderOfThisPass,
@@ -214,6 +220,7 @@ public:
             addMetrics();
             addNamed(ratioMistakes);
             addNamed(partMistakes);
+            addNamed(deadMemories, Candidate::place);
             addDecisionsOfRatio();
             break;
         case Stage::extrinsic:

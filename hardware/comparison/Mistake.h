@@ -67,6 +67,8 @@ struct Mistake {
         lesser,              ///< a decision for the lesser candidate: for state `number`, or see TreeNode
         branchMissing,       ///< 0 for the branch metrics
         branchMisread,       ///< branch metrics of another step
+        forwardMissing,      ///< ratios from forward metrics of 0
+        backwardMissing,     ///< ratios from backward metrics of 0
         forwardMisread,      ///< ratios from forward metrics of another step
         backwardMisread,     ///< ratios from backward metrics of another step
         ratioMisread,        ///< extrinsic values from the ratio of another step

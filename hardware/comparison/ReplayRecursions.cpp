@@ -355,10 +355,12 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
 {
     Sources sources;
     const unsigned shift = shiftOf(mistake);
-    const unsigned forwardStep = addressed(trellisStep, mistake, Mistake::forwardMisread, sources);
-    const unsigned backwardStep = addressed(trellisStep, mistake, Mistake::backwardMisread, sources);
-    const auto a = shifted(metrics(pass, Stage::forward, forwardStep, sources), shift);
-    const auto b = shifted(metrics(pass, Stage::backward, backwardStep, sources), shift);
+    const auto metricsOf = [&](Stage stage, Mistake::Kind misread, Mistake::Kind missing) {
+        const unsigned step = addressed(trellisStep, mistake, misread, sources);
+        return mistake == missing ? Metrics{} : shifted(metrics(pass, stage, step, sources), shift);
+    };
+    const Metrics a = metricsOf(Stage::forward, Mistake::forwardMisread, Mistake::forwardMissing);
+    const Metrics b = metricsOf(Stage::backward, Mistake::backwardMisread, Mistake::backwardMissing);
     const auto g = shifted(branchesOfRatio(pass, trellisStep, mistake, sources), shift);
     const auto ratio = [&](const auto& rule, auto kind) {
         using Value = decltype(kind);

@@ -88,18 +88,19 @@ std::optional<SharedAddress> sharedBits(const Model& model, const std::vector<Fa
         differing |= *address ^ *first;
         addresses.insert(*address);
     }
-    constexpr std::size_t fewestAtOne = 4;
-    if (differing == 0) {
-        const bool isTelling = faults.size() >= fewestAtOne;
-        return isTelling ? std::optional(SharedAddress{isOfExtrinsic, ~0U, *first}) : std::nullopt;
+    if (addresses.size() == 1) {
+        constexpr std::size_t fewest = 4;
+        return faults.size() >= fewest ? std::optional(SharedAddress{isOfExtrinsic, ~0U, *first}) : std::nullopt;
     }
-    constexpr std::size_t fewestSharing = 16;  // fewer may have a bit in common by chance
-    for (unsigned bit = 1; addresses.size() >= fewestSharing && bit < model.cut.K(); bit *= 2) {
-        if ((differing & bit) == 0) {
-            return SharedAddress{isOfExtrinsic, bit, *first & bit};
-        }
+    unsigned mask = 0;
+    std::size_t coincidences = 0;  // of bits
+    for (unsigned bit = 1; bit < model.cut.K(); bit *= 2) {
+        mask |= ~differing & bit;
+        coincidences += (differing & bit) != 0 ? 0 : addresses.size() - 1;
     }
-    return std::nullopt;
+    constexpr std::size_t fewest = 15;  // fewer may be chance
+    return mask != 0 && coincidences >= fewest ? std::optional(SharedAddress{isOfExtrinsic, mask, *first & mask})
+                                               : std::nullopt;
 }
 
 std::optional<SharedAddress> sharedAddress(const Model& model, const std::vector<Fault>& faults)
@@ -262,15 +263,22 @@ std::string Where::addressText() const
     if (!itsAddress) {
         return "";
     }
-    if (itsAddress->mask == ~0U) {
-        return "at address " + std::to_string(itsAddress->bits) + " of the extrinsic values alone";
+    const auto [isOfExtrinsic, mask, bits] = *itsAddress;
+    if (mask == ~0U) {
+        return "at address " + std::to_string(bits) + " of the extrinsic values alone";
     }
-    unsigned bit = 0;
-    while (itsAddress->mask >> bit != 1) {
-        ++bit;
+    const std::string what = isOfExtrinsic ? "at addresses of extrinsic values " : "at steps ";
+    if (mask > 1 && (mask & (mask + 1)) == 0) {
+        return what + std::to_string(bits) + " + " + std::to_string(mask + 1) + " n alone";
     }
-    return (itsAddress->isOfExtrinsic ? "at addresses of extrinsic values whose bit " : "at steps whose bit ") +
-           std::to_string(bit) + " is " + (itsAddress->bits != 0 ? "1" : "0") + " alone";
+    std::string text;
+    for (unsigned bit = 0; mask >> bit != 0; ++bit) {
+        if ((mask >> bit & 1U) != 0) {
+            text += (text.empty() ? "" : " and ") + ("bit " + std::to_string(bit)) + " is " +
+                    std::to_string(bits >> bit & 1U);
+        }
+    }
+    return what + "whose " + text + " alone";
 }
 
 std::string Where::stepText() const

@@ -433,6 +433,13 @@ INSTANTIATE_TEST_SUITE_P(
                   0,
                   ratio,
                   "faults:\n  bit 5 of the address of forward metrics reads as 0 (rule 8).\n"},
+        FaultCase{"ratio_cell_dead",
+                  512,
+                  2,
+                  1,
+                  0,
+                  ratio,
+                  "at steps 5 + 64 n alone:\n  forward metrics read as zeros (rule 8).\n"},
         FaultCase{"ratio_seven_bits", 512, 2, 1, 0, ratio, "faults:\n  values are 7 bits wide, not 12 (rule 2).\n"},
         FaultCase{"one_unit_stuck_bit", 512, 2, 1, 0, extrinsic, "in unit 1 alone:\n  bit 1 is stuck at 0.\n"}),
     [](const testing::TestParamInfo<FaultCase>& each) { return std::string(each.param.fault); });

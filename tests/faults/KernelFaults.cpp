@@ -469,6 +469,20 @@ class RatioAddressBit : public FaultyEngine {
     }
 };
 
+/// A cell of the forward metrics' memory, which each window of 64 steps uses anew, reads as zeros.
+class RatioCellDead : public FaultyEngine {
+    using FaultyEngine::FaultyEngine;
+
+    short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
+    {
+        const T8 zeros{};
+        for (unsigned k = 0; k < n; ++k) {
+            FaultyEngine::llr(1, k % 64 == 5 ? &zeros : a + k, b + k, g + k, out + k);
+        }
+        return out + n;
+    }
+};
+
 /// The last subtraction of a ratio is wider and saturates.
 class UnwrappedRatios : public FaultyEngine {
     using FaultyEngine::FaultyEngine;
@@ -520,6 +534,7 @@ const std::vector<Fault>& kernelFaults()
         inEngine<RatioOfNextForward>("ratio_forward_behind"),
         inEngine<ForwardOfNextBranch>("forward_branch_behind"),
         inEngine<RatioAddressBit>("ratio_address_bit"),
+        inEngine<RatioCellDead>("ratio_cell_dead"),
         inEngine<NegatedRatios>("ratio_sign"),
         inEngine<RoundedRatios>("ratio_rounding"),
         inEngine<UnwrappedRatios>("ratio_unwrapped"),

@@ -476,6 +476,13 @@ public:
         return extracted;
     }
 
+protected:
+    /// The distance of the tail from a stream's begin.
+    std::ptrdiff_t tail() const
+    {
+        return static_cast<std::ptrdiff_t>(K());
+    }
+
 private:
     virtual void alter() = 0;
 };
@@ -498,7 +505,7 @@ class TailSwapped : public AlteredStreams {
 
     void alter() override
     {
-        std::swap_ranges(itsSys[0].begin() + K(), itsSys[0].end(), itsPar0[0].begin() + K());
+        std::swap_ranges(itsSys[0].begin() + tail(), itsSys[0].end(), itsPar0[0].begin() + tail());
     }
 };
 
@@ -507,8 +514,8 @@ class TailReversed : public AlteredStreams {
 
     void alter() override
     {
-        std::reverse(itsSys[1].begin() + K(), itsSys[1].end());
-        std::reverse(itsPar0[1].begin() + K(), itsPar0[1].end());
+        std::reverse(itsSys[1].begin() + tail(), itsSys[1].end());
+        std::reverse(itsPar0[1].begin() + tail(), itsPar0[1].end());
     }
 };
 
@@ -517,8 +524,8 @@ class TailOfOtherCode : public AlteredStreams {
 
     void alter() override
     {
-        std::copy(itsSys[0].begin() + K(), itsSys[0].end(), itsSys[1].begin() + K());
-        std::copy(itsPar0[0].begin() + K(), itsPar0[0].end(), itsPar0[1].begin() + K());
+        std::copy(itsSys[0].begin() + tail(), itsSys[0].end(), itsSys[1].begin() + tail());
+        std::copy(itsPar0[0].begin() + tail(), itsPar0[0].end(), itsPar0[1].begin() + tail());
     }
 };
 
