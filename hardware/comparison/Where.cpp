@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <bitset>
 #include <set>
 
 namespace morvik::comparison {
@@ -67,6 +68,27 @@ std::optional<unsigned> common(const std::vector<Fault>& faults, Property proper
     return all ? std::optional<unsigned>(first) : std::nullopt;
 }
 
+/// All bits up to the highest one of a number.
+constexpr unsigned allBits(unsigned number)
+{
+    unsigned bits = 0;
+    while (number > bits) {
+        bits = 2 * bits + 1;
+    }
+    return bits;
+}
+
+std::size_t bitsIn(unsigned mask)
+{
+    return std::bitset<32>(mask).count();
+}
+
+/// Whether the mask has low bits alone: addresses that share these are a power of two apart.
+constexpr bool isPeriod(unsigned mask)
+{
+    return (mask & (mask + 1)) == 0;
+}
+
 std::optional<unsigned> addressOf(const Model& model, const Place& place, bool isOfExtrinsic)
 {
     return isOfExtrinsic                ? extrinsicAddress(model, place)
@@ -92,15 +114,13 @@ std::optional<SharedAddress> sharedBits(const Model& model, const std::vector<Fa
         constexpr std::size_t fewest = 4;
         return faults.size() >= fewest ? std::optional(SharedAddress{isOfExtrinsic, ~0U, *first}) : std::nullopt;
     }
-    unsigned mask = 0;
-    std::size_t coincidences = 0;  // of bits
-    for (unsigned bit = 1; bit < model.cut.K(); bit *= 2) {
-        mask |= ~differing & bit;
-        coincidences += (differing & bit) != 0 ? 0 : addresses.size() - 1;
-    }
-    constexpr std::size_t fewest = 15;  // fewer may be chance
-    return mask != 0 && coincidences >= fewest ? std::optional(SharedAddress{isOfExtrinsic, mask, *first & mask})
-                                               : std::nullopt;
+    const unsigned mask = ~differing & allBits(model.cut.K() - 1);
+    // Few neighbours share their high bits. Low bits are hardly shared by chance, nor is any bit of many addresses.
+    constexpr std::size_t fewestCoincidences = 15;
+    constexpr std::size_t fewestAddresses = 16;
+    const bool isTelling = isPeriod(mask) ? (addresses.size() - 1) * bitsIn(mask) >= fewestCoincidences
+                                          : addresses.size() >= fewestAddresses;
+    return mask != 0 && isTelling ? std::optional(SharedAddress{isOfExtrinsic, mask, *first & mask}) : std::nullopt;
 }
 
 std::optional<SharedAddress> sharedAddress(const Model& model, const std::vector<Fault>& faults)
@@ -268,7 +288,7 @@ std::string Where::addressText() const
         return "at address " + std::to_string(bits) + " of the extrinsic values alone";
     }
     const std::string what = isOfExtrinsic ? "at addresses of extrinsic values " : "at steps ";
-    if (mask > 1 && (mask & (mask + 1)) == 0) {
+    if (mask > 1 && isPeriod(mask)) {
         return what + std::to_string(bits) + " + " + std::to_string(mask + 1) + " n alone";
     }
     std::string text;

@@ -143,6 +143,27 @@ TEST_P(Mistakes, AreNotNamedForGarbage)
     }
 }
 
+TEST(Places, AreNotToldByBitsThatNeighboursShare)
+{
+    const Model model = modelOf(256, 1, 16);
+    const unsigned ratio = morvik::signalsOf(Stage::ratio).first;
+    Values dump = model.values;
+    const auto expectFound = [&](const std::string& where) {
+        const auto found = findingIn(model, dump, Stage::ratio);
+        ASSERT_TRUE(found);
+        EXPECT_EQ(found->where, "in half-iteration 3 alone, " + where + " alone");
+    };
+    for (const unsigned step : {100U, 101U, 102U}) {
+        dump.set({3, ratio, step}, 1000);
+    }
+    expectFound("in segment 1");
+    dump = model.values;
+    for (const unsigned step : {37U, 101U, 165U, 229U}) {
+        dump.set({3, ratio, step}, 1000);
+    }
+    expectFound("at steps 37 + 64 n");
+}
+
 TEST(FittedMistakes, TakeTheSimplestFactorThatFits)
 {
     const Model model = modelOf(256, 1, 16);
