@@ -70,9 +70,12 @@ void writeTable(std::ostream& page, const std::vector<CoverageRow>& rows)
             "<thead><tr><th scope=\"col\">Situation</th><th scope=\"col\">What it is</th>"
             "<th scope=\"col\" colspan=\"2\">Times met</th></tr></thead>\n";
     const CoverageRow* const end = rows.data() + rows.size();
-    for (const CoverageRow *first = rows.data(), *last = first; first != end; first = last) {
-        last = std::find_if(first, end, [first](const CoverageRow& row) { return row.rule != first->rule; });
+    const CoverageRow* first = rows.data();
+    while (first != end) {
+        const CoverageRow* const last =
+            std::find_if(first, end, [first](const CoverageRow& row) { return row.rule != first->rule; });
         writeRule(page, first, last, most);
+        first = last;
     }
     page << "</table>\n</div>\n</section>\n";
 }

@@ -146,6 +146,22 @@ coverage::Counts countsOf(const std::string& input)
     return coverage::readCounts(file.stream(), file.name());
 }
 
+/// All files that are read.
+std::vector<std::string> filesOf(const std::vector<std::string>& inputs)
+{
+    std::vector<std::string> files;
+    for (const std::string& input : inputs) {
+        if (std::filesystem::is_directory(input)) {
+            const std::filesystem::path manifest = std::filesystem::path(input) / vectors::manifestName;
+            const std::vector<std::string> ofSet = vectors::filesOf(input, vectors::readManifest(manifest));
+            files.insert(files.end(), ofSet.begin(), ofSet.end());
+        } else {
+            files.push_back(input);
+        }
+    }
+    return files;
+}
+
 int run(const Options& options)
 {
     if (options.list) {
@@ -155,10 +171,11 @@ int run(const Options& options)
     if (options.inputs.empty()) {
         throw base::Error("FILE is required; see 'morvik coverage --help'");
     }
-    base::expectOwnFile(options.output, options.inputs, "counts");
+    const std::vector<std::string> files = filesOf(options.inputs);
+    base::expectOwnFile(options.output, files, "counts");
     if (!options.report.empty()) {
         report::checkReport(options.report);
-        base::expectOwnFile(options.report, options.inputs, "results");
+        base::expectOwnFile(options.report, files, "results");
     }
     coverage::Counts counts;
     for (const std::string& input : options.inputs) {

@@ -96,16 +96,21 @@ void setUnknown(vpiHandle object)
     vpi_put_value(object, &value, nullptr, vpiNoDelay);
 }
 
+std::string textOf(vpiHandle object)
+{
+    s_vpi_value value{};
+    value.format = vpiStringVal;
+    vpi_get_value(object, &value);
+    return value.value.str;
+}
+
 /// A signal's number, from its name or as it is.
 int signalOf(vpiHandle object)
 {
     if (!isString(object)) {
         return argument(object, "The signal");
     }
-    s_vpi_value value{};
-    value.format = vpiStringVal;
-    vpi_get_value(object, &value);
-    const std::string name = value.value.str;
+    const std::string name = textOf(object);
     const int signal = morvik_checker_signal(name.c_str());
     if (signal < 0) {
         throw Mistake("\"" + name + "\" is no signal; there are " + morvik::signalNames());
@@ -343,6 +348,14 @@ int reportBlock(const std::vector<vpiHandle>& arguments)
     return mayBePartial ? MORVIK_CHECKER_AGREES : standing;
 }
 
+int writeSituations(const std::vector<vpiHandle>& arguments)
+{
+    morvik_checker* const checker = checkerOf(arguments[0]);
+    const int status = morvik_checker_write_situations(checker, textOf(arguments[1]).c_str());
+    reportMessages(checker);
+    return status;
+}
+
 int destroyChecker(const std::vector<vpiHandle>& arguments)
 {
     checkerOf(arguments[0]);
@@ -362,6 +375,7 @@ constexpr Call observeCall{"$morvik_observe", "isiiv"};
 constexpr Call valueCall{"$morvik_value", "isii"};
 constexpr Call ratioCall{"$morvik_ratio", "ii"};
 constexpr Call reportCall{"$morvik_report", "ii"};
+constexpr Call writeSituationsCall{"$morvik_write_situations", "is"};
 constexpr Call destroyCheckerCall{"$morvik_checker_destroy", "i"};
 
 /// Elements of an array of reals appear to have one bit, like those of hard bits.
@@ -456,6 +470,7 @@ void announceAll()
     announce(valueCall, vpiSysFunc, run<value, MORVIK_CHECKER_UNKNOWN, true>);
     announce(ratioCall, vpiSysFunc, run<ratio, MORVIK_CHECKER_UNKNOWN, true>);
     announce(reportCall, vpiSysFunc, run<reportBlock, MORVIK_CHECKER_REFUSED, true>);
+    announce(writeSituationsCall, vpiSysFunc, run<writeSituations, MORVIK_CHECKER_REFUSED, true>);
     announce(destroyCheckerCall, vpiSysTask, run<destroyChecker, 0, false>);
     announceUnits();
 }

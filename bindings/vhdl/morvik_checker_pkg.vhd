@@ -89,6 +89,9 @@ package morvik_checker_pkg is
         partial  : in  boolean := false
     );
 
+    -- Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`.
+    procedure morvik_write_situations (checker : in integer; file_name : in string);
+
     -- Releases a checker. An unknown number is ignored.
     procedure morvik_checker_destroy (checker : in integer);
 
@@ -108,6 +111,7 @@ package morvik_checker_pkg is
     impure function morvik_vhdl_checker_ratio (checker, position : integer) return integer;
     impure function morvik_vhdl_checker_standing (checker : integer) return integer;
     impure function morvik_vhdl_checker_report (checker : integer) return integer;
+    impure function morvik_vhdl_checker_situations (checker : integer) return integer;
     impure function morvik_vhdl_checker_message (checker : integer) return integer;
 
     attribute foreign of morvik_vhdl_checker_create : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_create";
@@ -122,6 +126,7 @@ package morvik_checker_pkg is
     attribute foreign of morvik_vhdl_checker_ratio : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_ratio";
     attribute foreign of morvik_vhdl_checker_standing : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_standing";
     attribute foreign of morvik_vhdl_checker_report : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_report";
+    attribute foreign of morvik_vhdl_checker_situations : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_situations";
     attribute foreign of morvik_vhdl_checker_message : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_message";
 
 end package morvik_checker_pkg;
@@ -301,6 +306,27 @@ package body morvik_checker_pkg is
         standing := result;
     end procedure morvik_report;
 
+    procedure morvik_write_situations (checker : in integer; file_name : in string) is
+        file counts : std.textio.text;
+        variable opened : file_open_status;
+        variable content : std.textio.line;
+        variable length : natural := morvik_vhdl_checker_situations(checker);
+        variable rows : string(1 to length) := morvik_taken(length);
+    begin
+        if length = 0 then
+            pass_on(checker, morvik_refused);
+            return;
+        end if;
+        std.textio.file_open(opened, counts, file_name, write_mode);
+        if opened /= open_ok then
+            morvik_report_line("ERROR:checker:" & file_name & ": cannot be written");
+            return;
+        end if;
+        std.textio.write(content, rows(1 to length - 1));  -- writeline ends the last one
+        std.textio.writeline(counts, content);
+        std.textio.file_close(counts);
+    end procedure morvik_write_situations;
+
     procedure morvik_checker_destroy (checker : in integer) is
     begin
         morvik_vhdl_checker_destroy(checker);
@@ -382,6 +408,12 @@ package body morvik_checker_pkg is
         report "morvik_vhdl_checker_report is foreign" severity failure;
         return 0;
     end function morvik_vhdl_checker_report;
+
+    impure function morvik_vhdl_checker_situations (checker : integer) return integer is
+    begin
+        report "morvik_vhdl_checker_situations is foreign" severity failure;
+        return 0;
+    end function morvik_vhdl_checker_situations;
 
     impure function morvik_vhdl_checker_message (checker : integer) return integer is
     begin

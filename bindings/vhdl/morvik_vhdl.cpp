@@ -243,10 +243,15 @@ MORVIK_API std::int32_t morvik_vhdl_checker_standing(std::int32_t checker)
     return morvik_checker_standing(findChecker(checker));
 }
 
-/// Takes the report, or the oldest message, as morvik_vhdl_message does.
+/// Takes the report, the counts of situations, or the oldest message, as morvik_vhdl_message does.
 MORVIK_API std::int32_t morvik_vhdl_checker_report(std::int32_t checker)
 {
     return take(morvik_checker_report(findChecker(checker)));
+}
+
+MORVIK_API std::int32_t morvik_vhdl_checker_situations(std::int32_t checker)
+{
+    return take(morvik_checker_situations(findChecker(checker)));
 }
 
 MORVIK_API std::int32_t morvik_vhdl_checker_message(std::int32_t checker)

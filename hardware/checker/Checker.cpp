@@ -47,6 +47,9 @@ Checker::Checker(const veltra_ip_morvik_v1_0_generics& generics) : itsGenerics(g
 {
     std::ostringstream warnings;
     const Decoder allowed(generics, warnings);
+    coverage::CoreCounts none;
+    none.core = coverage::coreOf(generics);
+    itsSituations.add(none);
 }
 
 void Checker::start(const SoftBlock& block, unsigned iterations, std::ostream& warnings)

@@ -126,7 +126,7 @@ private:
         Column words{};
         std::transform(metrics.begin(), metrics.end(), words.begin(), rules::wrap16);
         takeBorder(2, words, place);
-        const auto best = std::max_element(metrics.begin(), metrics.end());
+        const auto* const best = std::max_element(metrics.begin(), metrics.end());
         if (std::count(metrics.begin(), metrics.end(), *best) == 1) {
             const auto state = static_cast<unsigned>(best - metrics.begin());
             take(situation(Family::tailState, codeNumber(), state), placeOf(place, state));

@@ -163,6 +163,9 @@ TEST_F(Coverage, RefusesWhatIsNotAllowed)
                   {"one.csv", "--report", "one.txt"},
                   "one.txt: is not a name for a report, expected one that ends in .html");
     EXPECT_EQ(run("coverage", {"one.csv", "--output", "one.csv"}).status, 2);
+    const std::string manifest = morvik.read("one/manifest.json");
+    EXPECT_EQ(run("coverage", {"one", "--output", "one/manifest.json"}).status, 2);
+    EXPECT_EQ(morvik.read("one/manifest.json"), manifest);
     expectRefused(
         "vectors",
         {"--out", "set", "--cover", "tie.sideways"},

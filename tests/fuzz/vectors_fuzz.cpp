@@ -1,9 +1,12 @@
-// vectors_fuzz: the readers of sets of vectors take any files: the manifest, and the tables in every format.
+// vectors_fuzz: the readers of sets of vectors take any files: the manifest, the tables in every format, and counts of
+// situations.
 #include <filesystem>
+#include <sstream>
 
 #include "FuzzInput.h"
 #include "TemporaryFiles.h"
 #include "base/Error.h"
+#include "hardware/coverage/Counts.h"
 #include "hardware/vectors/BlockFiles.h"
 #include "hardware/vectors/Manifest.h"
 
@@ -22,6 +25,18 @@ void readManifestText(const std::string& text)
                 require(file.name == std::filesystem::path(file.name).filename(), "a file lies in the folder");
             }
         }
+    } catch (const morvik::base::Error& error) {
+        requireOneLine(error, "in");
+    }
+}
+
+void readSituations(const std::string& text)
+{
+    std::istringstream file(text);
+    try {
+        const std::string read = textOf(morvik::coverage::readCounts(file, "in"));
+        std::istringstream again(read);
+        require(textOf(morvik::coverage::readCounts(again, "in")) == read, "what was read is written, and read again");
     } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in");
     }
@@ -67,10 +82,15 @@ void readBlocks(FuzzInput& input)
 int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
     FuzzInput input(data, size);
-    if (input.below(2) == 0) {
+    switch (input.below(3)) {
+    case 0:
         readManifestText(input.text());
-    } else {
+        break;
+    case 1:
         readBlocks(input);
+        break;
+    default:
+        readSituations(input.text());
     }
     return 0;
 }

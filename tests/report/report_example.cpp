@@ -4,6 +4,7 @@
 #include <iostream>
 #include <string>
 
+#include "report/CoveragePage.h"
 #include "report/Page.h"
 #include "report/Plot.h"
 #include "support/SampleCurves.h"
@@ -42,6 +43,19 @@ void writeHostile(const std::string& folder)
         folder + "/hostile.html", curves, {curves[1].title, {{curves[1].title, curves[0].title}}, curves[0].title});
 }
 
+void writeCoverage(const std::string& folder)
+{
+    morvik::report::CoverageDescription coverage;
+    coverage.lead = "3 of 4 met";
+    coverage.cores = {{"2 units, max-log", 1234}};
+    coverage.rows = {{3, "tie.forward.0", "The candidates are <equal>", 1000000, ""},
+                     {3, "tie.forward.1", "The candidates & what follows", 0, ""},
+                     {9, "table.none", "A difference is beyond the table", 0, "max-log has no table"},
+                     {16, "decision.zero", "A ratio is 0", 1, ""},
+                     {16, "decision.one", "A ratio is positive", 1000, ""}};
+    morvik::report::writeCoveragePage(folder + "/coverage.html", coverage);
+}
+
 }  // namespace
 
 int main(int argc, char** argv)
@@ -54,6 +68,7 @@ int main(int argc, char** argv)
         write(argv[1]);
         writeIterations(argv[1]);
         writeHostile(argv[1]);
+        writeCoverage(argv[1]);
         return 0;
     } catch (const std::exception& error) {
         std::cerr << "report_example: " << error.what() << '\n';

@@ -63,6 +63,30 @@ class ReportInBrowser(unittest.TestCase):
     def tip_is_shown(self):
         return self.evaluate("document.getElementById('tip').checkVisibility()")
 
+    # ---- Coverage
+
+    def shown(self, selector):
+        return self.evaluate(f"Array.from(document.querySelectorAll({selector!r}), found => found.checkVisibility())")
+
+    def test_coverage_shows_counts_as_bars(self):
+        self.open("coverage.html")
+        self.assertEqual((self.browser.messages, len(self.browser.requests)), ([], 1))
+        self.assertEqual(self.texts(".situations tbody tr:first-child .count"), ["1 of 2", "0 of 0", "2 of 2"])
+        self.assertEqual(self.texts(".missing code"), ["tie.forward.1"])
+        self.assertEqual(self.texts(".impossible .why"), ["cannot occur: max-log has no table"])
+        self.assertIn("The candidates are <equal>", self.texts(".text"))
+        most, least, between = self.evaluate(
+            "Array.from(document.querySelectorAll('.bar span'), bar => bar.getBoundingClientRect().width)")
+        self.assertTrue(0 < least < between < most, (least, between, most))
+        self.assertAlmostEqual(between / most, 0.5, delta=0.02)  # a thousand of a million
+
+    def test_coverage_shows_what_is_missing_alone(self):
+        self.open("coverage.html")
+        self.assertEqual(self.shown(".situations code"), [True] * 5)
+        self.browser.click(*self.middle("#only"))
+        self.assertEqual(self.shown(".situations code"), [False, True, False, False, False])
+        self.assertEqual(self.shown(".situations tbody"), [True, False, False])
+
     # ---- Loading
 
     def test_messages_would_be_noticed(self):

@@ -61,5 +61,8 @@ module checker_use_tb;
         $morvik_checker_destroy(one);
         answer = $morvik_observe(one, "llr", 0, 0, 0);
         $morvik_checker_destroy(one);
+        $display("situations");
+        answer = $morvik_write_situations(other, "/nowhere/met.csv");
+        $display("answer %0d, written %0d", answer, $morvik_write_situations(other, "/dev/null"));
     end
 endmodule

@@ -14,6 +14,8 @@ begin
         variable sys, par1, par2     : morvik_soft_values(0 to 43) := (others => -24);
         variable row                 : morvik_metrics(7 downto 0);
         variable one, other, answer  : integer;
+        variable content             : std.textio.line;
+        file counts                  : std.textio.text;
     begin
         report "a configuration that does not exist";
         assert morvik_checker_create(num_pu => 3) = 0 severity failure;
@@ -91,6 +93,16 @@ begin
         morvik_observe(one, morvik_llr, 0, 0, 0, answer);
         assert answer = morvik_refused severity failure;
         assert morvik_integer("1000") = -8 and morvik_integer("0111") = 7 severity failure;
+
+        report "situations";
+        morvik_write_situations(one, "checker_use_situations.csv");
+        morvik_write_situations(other, "/nowhere/met.csv");
+        morvik_write_situations(other, "checker_use_situations.csv");
+        std.textio.file_open(counts, "checker_use_situations.csv", read_mode);
+        std.textio.readline(counts, content);
+        assert content.all = "num_pu,algorithm,situation,count" severity failure;
+        std.textio.readline(counts, content);
+        report content.all;
         report "done";
         wait;
     end process test;

@@ -197,7 +197,8 @@ std::map<std::string, std::uint64_t> countsOf(const std::string& file)
 TEST(Checker, CountsTheSituationsOfAllBlocks)
 {
     const Checker checker = started(1);
-    EXPECT_EQ(countsOf(morvik_checker_situations(checker.get()))["blocks"], 0U);
+    const std::string nothing = morvik_checker_situations(checker.get());
+    EXPECT_EQ(nothing.rfind("num_pu,algorithm,situation,count\n2,scaled,blocks,0\n2,scaled,wrap.sum.above,0\n", 0), 0U);
     for (int signal = 0; signal < MORVIK_CHECKER_SIGNALS; ++signal) {
         observeAll(checker, signal);
     }
