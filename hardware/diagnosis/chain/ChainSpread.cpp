@@ -17,7 +17,7 @@ constexpr double beyondPromise = 1.35;
 /// The same in standard deviations.
 constexpr double certain = 6;
 
-constexpr unsigned eighths = 8;
+constexpr unsigned slices = 8;  // of a code block's values: eighths
 
 /// Signs, and how many of them would be wrong if the values were ratios.
 struct Portion {
@@ -62,8 +62,8 @@ std::string symbolBitName(unsigned bit)
 
 std::string eighthName(unsigned eighth)
 {
-    return "eighth " + std::to_string(eighth % eighths + 1) + " of a code block's values in " +
-           transmissionName(eighth / eighths);
+    return "eighth " + std::to_string(eighth % slices + 1) + " of a code block's values in " +
+           transmissionName(eighth / slices);
 }
 
 /// Values by a property that says nothing of how often noise makes them wrong, but for what they promise themselves.
@@ -81,7 +81,7 @@ std::vector<Division> divisionsOf(const std::vector<AgreeingValue>& values)
         divisions[1].numbers.push_back(each.transmission);
         divisions[2].numbers.push_back(each.codeBlock);
         divisions[3].numbers.push_back(each.symbolBit);
-        divisions[4].numbers.push_back(eighths * each.transmission + each.eighth);
+        divisions[4].numbers.push_back(slices * each.transmission + each.eighth);
     }
     return divisions;
 }
