@@ -23,6 +23,8 @@ constexpr std::array<std::uint8_t, columns> columnOrder = {0, 16, 8, 24, 4, 20, 
 
 /// Of one stream of the largest block, dummy bits included.
 constexpr std::size_t mostPositions = 6176;
+static_assert(mostPositions % columns == 0 &&
+              mostPositions - rules::blockSizes.back().K - rules::tailPositions < columns);
 
 constexpr std::uint16_t null = 0xFFFF;  // more than any position: three streams have at most 18444 bits
 

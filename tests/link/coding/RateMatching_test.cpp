@@ -148,6 +148,42 @@ TEST(RateMatchingTest, ALimitedBufferIsTheFirstPartOfTheWholeOne)
     EXPECT_EQ(RateMatching(512, 5, 100000).positions(), whole.positions());
 }
 
+/// k_0 = R (2 ceil(N_cb / (8 R)) rv + 2) steps where N_cb passes a multiple of 8 R.
+TEST(RateMatchingTest, StartsEachVersionWhereTheStandardSays)
+{
+    constexpr unsigned K = 512;
+    constexpr unsigned R = 17;
+    for (unsigned eighths = 5; eighths <= 11; ++eighths) {
+        for (const unsigned size : {8 * R * eighths - 1, 8 * R * eighths, 8 * R * eighths + 1}) {
+            const RateMatching matching(K, 0, size);
+            const unsigned steps = size > 8 * R * eighths ? eighths + 1 : eighths;
+            for (unsigned version = 0; version < 4; ++version) {
+                const unsigned start = R * (2 * steps * version + 2) % size;
+                EXPECT_EQ(matching.start(version), RateMatching(K, 0, start).size()) << size << ' ' << version;
+            }
+        }
+    }
+}
+
+TEST(RateMatchingTest, PlacesATransmissionWhereItRecoversIt)
+{
+    const RateMatching matching(40, 3);
+    const std::size_t size = matching.size();
+    for (unsigned version = 0; version < 4; ++version) {
+        for (const std::size_t count : {std::size_t{1}, size / 2, size - 1, size}) {
+            std::vector<std::int8_t> received(count);
+            std::iota(received.begin(), received.end(), std::int8_t{-60});
+            const std::vector<float> ratios(received.begin(), received.end());
+            std::vector<float> sums(size);
+            matching.recover(ratios.data(), version, count, sums.data());
+            std::vector<std::int8_t> buffer(size + 2, 77);
+            matching.place(received.data(), version, count, &buffer[1]);
+            EXPECT_EQ(std::vector<float>(buffer.begin() + 1, buffer.end() - 1), sums) << version << ' ' << count;
+            EXPECT_TRUE(buffer.front() == 77 && buffer.back() == 77);
+        }
+    }
+}
+
 TEST(RateMatchingTest, ClipsEachSumToTheWidthOfTheSoftBuffer)
 {
     const RateMatching matching(40, 0);
