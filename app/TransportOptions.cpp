@@ -5,8 +5,8 @@
 
 #include "Arguments.h"
 #include "Lists.h"
-#include "TransportFit.h"
 #include "base/Numbers.h"
+#include "simulation/TransportFit.h"
 
 namespace morvik {
 
@@ -70,7 +70,7 @@ void addTransportOptions(CLI::App& command, CLI::Option& transport, TransportOpt
 {
     CLI::Option* const codedBits =
         command.add_option("--coded-bits", options.codedBits, "Bits of one transmission of a transport block (G)")
-            ->transform(integerFrom(1, mostCodedBits))
+            ->transform(integerFrom(1, simulation::mostCodedBits))
             ->type_name("G")
             ->needs(&transport);
     transport.needs(codedBits);
@@ -101,7 +101,7 @@ link::TransportBlockCode transportBlockCode(std::uint32_t bits,
                                             const TransportOptions& options,
                                             const std::string& block)
 {
-    checkFit({bits, options.codedBits, options.modulation, options.softBufferSize}, block);
+    simulation::checkFit({bits, options.codedBits, options.modulation, options.softBufferSize}, block);
     return link::TransportBlockCode({bits,
                                      options.codedBits,
                                      bitsPerSymbol(options.modulation),

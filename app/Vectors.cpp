@@ -32,7 +32,7 @@ struct Options {
     std::string output;
     std::string checked;
     DecoderOptions decoder;
-    LinkOptions link;              ///< of transport blocks
+    simulation::LinkOptions link;  ///< of transport blocks
     std::optional<int> milliEbn0;  ///< as given, like
     std::optional<int> milliEsn0;  ///< this one
     CoverOptions situations;
@@ -115,7 +115,8 @@ std::vector<simulation::Point> transportOf(const Options& options)
             "--modulation, --channel, --demapper and --esn0 need transport blocks, by --transport-block-size or "
             "--mcs: plain code blocks are sent over BPSK and Gaussian noise");
     }
-    std::vector<simulation::LinkFormat> formats = formatsOf(options.link, !options.settings.blockSizes.empty());
+    std::vector<simulation::LinkFormat> formats =
+        simulation::formatsOf(options.link, !options.settings.blockSizes.empty());
     if (!hasTransportBlocks) {
         return {};
     }

@@ -4,18 +4,16 @@
 #include <algorithm>
 #include <charconv>
 
-#include "app/TransportFit.h"
+#include "Point.h"
+#include "TransportFit.h"
 #include "base/Error.h"
 #include "base/Numbers.h"
 #include "base/Thousandths.h"
 #include "link/coding/CodeBlocks.h"
-#include "simulation/Point.h"
 
-namespace morvik {
+namespace morvik::simulation {
 
 namespace {
-
-using simulation::LinkFormat;
 
 std::string rateText(double rate)
 {
@@ -26,7 +24,7 @@ std::string rateText(double rate)
 std::string transportOption(const LinkOptions& options)
 {
     if (!options.versions.empty()) {
-        return "--redundancy-versions " + simulation::versionsText(options.versions, ',');
+        return "--redundancy-versions " + versionsText(options.versions, ',');
     }
     if (options.softBufferBits) {
         return "--soft-buffer-bits " + std::to_string(*options.softBufferBits);
@@ -74,14 +72,8 @@ void checkTogether(const LinkOptions& options, bool hasBlockSize)
         const unsigned last = countOf(table) - 1;
         expect(options.mcsIndices.back() <= last,
                "--mcs " + std::to_string(options.mcsIndices.back()) + " is not in --mcs-table " +
-                   std::string(simulation::nameOf(table)) + ", expected 0 to " + std::to_string(last));
+                   std::string(nameOf(table)) + ", expected 0 to " + std::to_string(last));
     }
-}
-
-/// The code rate of a transmission, with CRCs as information.
-double effectiveRate(const LinkFormat& format)
-{
-    return static_cast<double>(countedBitsOf(format, 0)) / format.codedBits;
 }
 
 /// The fewest coded bits of each transmission whose sum is no less than what they are to tell.
@@ -195,6 +187,11 @@ LinkFormat formatOf(const LinkOptions& options, unsigned index, LinkFormat forma
 
 }  // namespace
 
+double effectiveRate(const LinkFormat& format)
+{
+    return static_cast<double>(countedBitsOf(format, 0)) / format.codedBits;
+}
+
 std::vector<LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize)
 {
     checkTogether(options, hasBlockSize);
@@ -225,25 +222,4 @@ std::vector<LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize)
     return formats;
 }
 
-std::string highRateWarning(const std::vector<LinkFormat>& formats)
-{
-    constexpr double skipped = 0.931;
-    const auto isHigh = [](const LinkFormat& format) {
-        return format.hasTransportBlocks() && effectiveRate(format) > skipped;
-    };
-    const auto count = static_cast<std::uint64_t>(std::count_if(formats.begin(), formats.end(), isHigh));
-    if (count == 0) {
-        return "";
-    }
-    const LinkFormat& highest = *std::max_element(formats.begin(), formats.end(), [](const auto& a, const auto& b) {
-        return effectiveRate(a) < effectiveRate(b);
-    });
-    return "the code rate with CRCs is " + rateText(effectiveRate(highest)) + " for " +
-           (highest.mcs
-                ? "MCS " + mcsText(highest.mcs)
-                : "A = " + std::to_string(highest.transportBlockSize) + ", G = " + std::to_string(highest.codedBits)) +
-           (count > 1 ? ", the highest of " + std::to_string(count) + " above 0.931" : "") +
-           ": above 0.931, a terminal may leave out decoding (3GPP TS 36.213, 7.1.7)";
-}
-
-}  // namespace morvik
+}  // namespace morvik::simulation

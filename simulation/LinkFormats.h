@@ -1,14 +1,14 @@
 // LinkFormats: what the options of `morvik ber` that describe the link send. Python has the same options.
-#ifndef MORVIK_APP_BER_LINKFORMATS_H
-#define MORVIK_APP_BER_LINKFORMATS_H
+#ifndef MORVIK_SIMULATION_LINKFORMATS_H
+#define MORVIK_SIMULATION_LINKFORMATS_H
 
 #include <optional>
 #include <string>
 #include <vector>
 
-#include "simulation/LinkFormat.h"
+#include "LinkFormat.h"
 
-namespace morvik {
+namespace morvik::simulation {
 
 constexpr unsigned usualResourceElements = 120;  // of the 168 of a pair, without control and reference signals
 
@@ -37,12 +37,11 @@ struct LinkOptions {
 
 /// What every combination of the options sends. `hasBlockSize`: plain code blocks are asked for. Throws base::Error for
 /// options that contradict each other or cannot be met.
-std::vector<simulation::LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize);
+std::vector<LinkFormat> formatsOf(const LinkOptions& options, bool hasBlockSize);
 
-/// A line for the options whose code rate is above that at which a terminal may leave out decoding (3GPP TS 36.213,
-/// 7.1.7): how many formats have it, and the highest. Empty if none has.
-std::string highRateWarning(const std::vector<simulation::LinkFormat>& formats);
+/// The code rate of a transmission of transport blocks, with CRCs as information.
+double effectiveRate(const LinkFormat& format);
 
-}  // namespace morvik
+}  // namespace morvik::simulation
 
 #endif

@@ -7,7 +7,7 @@
 #include "base/Text.h"
 #include "link/coding/TransportBlock.h"
 
-namespace morvik {
+namespace morvik::simulation {
 
 namespace {
 
@@ -63,4 +63,4 @@ void checkFit(const TransportChoice& choice, const std::string& block)
     }
 }
 
-}  // namespace morvik
+}  // namespace morvik::simulation

@@ -1,13 +1,13 @@
 // TransportFit: whether a transport block can be sent as options ask for, and what would fit.
-#ifndef MORVIK_APP_TRANSPORTFIT_H
-#define MORVIK_APP_TRANSPORTFIT_H
+#ifndef MORVIK_SIMULATION_TRANSPORTFIT_H
+#define MORVIK_SIMULATION_TRANSPORTFIT_H
 
 #include <cstdint>
 #include <string>
 
 #include "link/modulation/Modulation.h"
 
-namespace morvik {
+namespace morvik::simulation {
 
 /// Coded bits of a transmission, for options: four for each bit of the largest transport block, and few enough for a
 /// row of them.
@@ -25,6 +25,6 @@ struct TransportChoice {
 /// `block` names the transport block: "--transport-block-size 100".
 void checkFit(const TransportChoice& choice, const std::string& block);
 
-}  // namespace morvik
+}  // namespace morvik::simulation
 
 #endif

@@ -15,7 +15,6 @@
 #include "Notice.h"
 #include "Pictures.h"
 #include "base/Error.h"
-#include "base/Numbers.h"
 #include "base/OutputFile.h"
 #include "base/Shown.h"
 #include "base/Text.h"
@@ -25,6 +24,7 @@
 #include "simulation/Replay.h"
 #include "simulation/Run.h"
 #include "simulation/ThreadWorkers.h"
+#include "simulation/Warnings.h"
 #include "src/InstructionSetNames.h"
 
 namespace morvik {
@@ -81,36 +81,11 @@ void checkInstructionSet(const std::string& name)
     throw base::Error(message);
 }
 
-void warnOfRates(const BerMeans& means, const simulation::Plan& plan)
+void warn(const BerMeans& means, const std::string& warning)
 {
-    std::vector<simulation::LinkFormat> formats;
-    for (const simulation::Point& point : plan.points) {
-        if (formats.empty() || !(formats.back() == point.link)) {
-            formats.push_back(point.link);
-        }
-    }
-    const std::string warning = highRateWarning(formats);
     if (!warning.empty()) {
         notice(means.command + ": " + warning);
     }
-}
-
-/// Tells which curves have not fallen over the range of Es/N0 or Eb/N0 that was chosen for them.
-void tellUnfallen(const BerMeans& means,
-                  const simulation::Plan& plan,
-                  const std::vector<simulation::PointResult>& ended)
-{
-    constexpr double most = 0.01;
-    const std::vector<simulation::PointResult> ends = unfallenEnds(plan, ended, most);
-    if (ends.empty()) {
-        return;
-    }
-    const simulation::Tally& tally = ends.front().tally;
-    const simulation::Point& point = plan.points[ends.front().number];
-    const double rate = static_cast<double>(tally.errors.back().blockErrors) / static_cast<double>(tally.blocks);
-    notice(means.command + ": " + (ends.size() > 1 ? base::counted(ends.size(), "curve") + " end" : "a curve ends") +
-           " at a block error rate above 0.01: " + base::numberText(rate, std::chars_format::general, 2) + " at " +
-           placeText(point) + ", " + curveText(point) + "; --esn0 or --ebn0 sets the range");
 }
 
 int simulate(const BerMeans& means, const BerOptions& options, const simulation::Plan& plan)
@@ -127,7 +102,7 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
     if (options.resume && journal.isEmpty()) {
         notice(means.command + ": nothing to resume, starts from the beginning");
     }
-    warnOfRates(means, plan);
+    warn(means, highRateWarning(plan));
     bool isComplete = false;
     {
         const auto workers = means.makeWorkers(options, plan);
@@ -143,7 +118,7 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
     }
     if (isComplete) {
         if (options.sweep.milliDecibels.empty()) {
-            tellUnfallen(means, plan, journal.ended());
+            warn(means, unfallenWarning(plan, journal.ended()));
         }
         return success;
     }

@@ -344,7 +344,7 @@ std::string commandOf(const BerOptions& options, const simulation::StopRules& ru
     if (!sweep.blockSizes.empty()) {
         add("--block-size", listed(sweep.blockSizes, number));
     }
-    command += commandOf(options.link);
+    command += morvik::commandOf(options.link);
     add("--num-pu", listed(sweep.numPus, number));
     add("--algorithm", listed(sweep.algorithms, simulation::algorithmName));
     add("--scale", listed(sweep.scaleOptions, simulation::scaleOptionText));
@@ -425,7 +425,7 @@ simulation::Plan planOf(const BerOptions& options)
             "--each-iteration counts after every iteration, --early-stop crc keeps one: give one of them");
     }
     simulation::Sweep sweep = options.sweep;
-    sweep.formats = formatsOf(options.link, !sweep.blockSizes.empty());
+    sweep.formats = simulation::formatsOf(options.link, !sweep.blockSizes.empty());
     const std::uint64_t points = simulation::countOfPoints(sweep);
     if (points > mostPoints) {
         throw base::Error("the lists combine to " + std::to_string(points) + " points, a run has " +

@@ -23,7 +23,7 @@ struct ReplayedFrame {
 /// The options given; empty where the default depends on other options.
 struct BerOptions {
     simulation::Sweep sweep;
-    LinkOptions link;
+    simulation::LinkOptions link;
     bool eachIteration = false;
     std::optional<std::uint64_t> blockErrors;
     std::optional<std::uint64_t> bitErrors;

@@ -6,13 +6,13 @@
 
 #include "Arguments.h"
 #include "Lists.h"
-#include "TransportFit.h"
 #include "TransportOptions.h"
 #include "base/Error.h"
 #include "base/Numbers.h"
 #include "base/Thousandths.h"
 #include "link/coding/CodeBlocks.h"
 #include "link/coding/TransportBlock.h"
+#include "simulation/TransportFit.h"
 
 namespace morvik {
 
@@ -130,7 +130,7 @@ std::string_view stopName(bool stopsEarly)
 
 // ---- The options in groups
 
-void addSizes(CLI::App& command, LinkOptions& options)
+void addSizes(CLI::App& command, simulation::LinkOptions& options)
 {
     addListOption(command,
                   "--transport-block-size",
@@ -141,7 +141,7 @@ void addSizes(CLI::App& command, LinkOptions& options)
     addListOption(command,
                   "--coded-bits",
                   options.codedBits,
-                  integersOf("--coded-bits", 1, mostCodedBits),
+                  integersOf("--coded-bits", 1, simulation::mostCodedBits),
                   "Bits of one transmission of a transport block, G")
         ->type_name("G[,G...]");
     addListOption(command,
@@ -171,12 +171,12 @@ void addSizes(CLI::App& command, LinkOptions& options)
                1,
                mostResourceElements,
                "Symbols of a pair of resource blocks")
-        ->default_str(std::to_string(usualResourceElements));
+        ->default_str(std::to_string(simulation::usualResourceElements));
 }
 
 }  // namespace
 
-void addLinkOptions(CLI::App& command, LinkOptions& options)
+void addLinkOptions(CLI::App& command, simulation::LinkOptions& options)
 {
     addSizes(command, options);
     addListOption(command,
@@ -218,7 +218,7 @@ void addLinkOptions(CLI::App& command, LinkOptions& options)
         "max-log: by the nearest points; exact: by all");
 }
 
-void addEarlyStop(CLI::App& command, LinkOptions& options)
+void addEarlyStop(CLI::App& command, simulation::LinkOptions& options)
 {
     addChoice(command,
               "--early-stop",
@@ -228,7 +228,7 @@ void addEarlyStop(CLI::App& command, LinkOptions& options)
               "crc: each code block with the first iteration whose CRC fits; none: all --iterations");
 }
 
-std::string commandOf(const LinkOptions& options)
+std::string commandOf(const simulation::LinkOptions& options)
 {
     std::string command;
     const auto add = [&command](bool isGiven, const std::string& option, auto textOf) {

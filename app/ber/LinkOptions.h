@@ -5,18 +5,18 @@
 #include <CLI/CLI.hpp>
 #include <string>
 
-#include "LinkFormats.h"
+#include "simulation/LinkFormats.h"
 
 namespace morvik {
 
 /// Adds the options of what is sent and how it is received up to the decoder, which set `options`.
-void addLinkOptions(CLI::App& command, LinkOptions& options);
+void addLinkOptions(CLI::App& command, simulation::LinkOptions& options);
 
 /// Adds --early-stop.
-void addEarlyStop(CLI::App& command, LinkOptions& options);
+void addEarlyStop(CLI::App& command, simulation::LinkOptions& options);
 
 /// The options as a command repeats them, each after a blank.
-std::string commandOf(const LinkOptions& options);
+std::string commandOf(const simulation::LinkOptions& options);
 
 }  // namespace morvik
 

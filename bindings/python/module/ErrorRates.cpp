@@ -27,10 +27,10 @@ private:
 
 }  // namespace
 
-std::vector<simulation::ResultRow> errorRates(const simulation::Plan& plan,
-                                              unsigned threads,
-                                              const std::string& instructionSet,
-                                              const Listeners& listeners)
+std::vector<simulation::PointResult> errorRates(const simulation::Plan& plan,
+                                                unsigned threads,
+                                                const std::string& instructionSet,
+                                                const Listeners& listeners)
 {
     simulation::Journal inMemory(plan, {}, simulation::Journal::Earlier::refuse);
     simulation::ThreadWorkers workers(plan, threads, instructionSet);
@@ -40,7 +40,7 @@ std::vector<simulation::ResultRow> errorRates(const simulation::Plan& plan,
         return false;
     };
     run(plan, {workers, inMemory, progress, isInterrupted});
-    return simulation::resultsOf(plan, inMemory.ended()).rows;
+    return inMemory.ended();
 }
 
 }  // namespace morvik::python

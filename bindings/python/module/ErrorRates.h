@@ -16,11 +16,11 @@ struct Listeners {
     std::function<void(const std::vector<simulation::ResultRow>&)> hasEnded;  ///< the rows of a point
 };
 
-/// The rows of all points. With an empty instruction set, the decoder chooses.
-std::vector<simulation::ResultRow> errorRates(const simulation::Plan& plan,
-                                              unsigned threads,
-                                              const std::string& instructionSet,
-                                              const Listeners& listeners);
+/// All points. With an empty instruction set, the decoder chooses.
+std::vector<simulation::PointResult> errorRates(const simulation::Plan& plan,
+                                                unsigned threads,
+                                                const std::string& instructionSet,
+                                                const Listeners& listeners);
 
 }  // namespace morvik::python
 

@@ -13,10 +13,11 @@
 #include "Arrays.h"
 #include "Decoder.h"
 #include "ErrorRates.h"
-#include "app/TransportFit.h"
-#include "app/ber/LinkFormats.h"
 #include "base/Error.h"
 #include "base/Thousandths.h"
+#include "simulation/LinkFormats.h"
+#include "simulation/TransportFit.h"
+#include "simulation/Warnings.h"
 
 namespace py = pybind11;
 
@@ -123,7 +124,7 @@ Value named(std::optional<Value> value)
 }
 
 /// Sets what is given by name; an empty name is not given.
-void setNames(LinkOptions& options,
+void setNames(simulation::LinkOptions& options,
               const std::vector<std::string>& modulations,
               const std::string& channel,
               const std::string& demapper,
@@ -145,7 +146,7 @@ void setNames(LinkOptions& options,
 }
 
 /// A sweep with the formats that the options ask for. Throws Refusal with the text of the command.
-simulation::Sweep sweepOf(simulation::Sweep sweep, const LinkOptions& options)
+simulation::Sweep sweepOf(simulation::Sweep sweep, const simulation::LinkOptions& options)
 {
     try {
         sweep.formats = formatsOf(options, !sweep.blockSizes.empty());
@@ -155,15 +156,23 @@ simulation::Sweep sweepOf(simulation::Sweep sweep, const LinkOptions& options)
     return sweep;
 }
 
+void tell(const py::object& warn, const std::string& warning)
+{
+    if (!warning.empty()) {
+        warn(warning);
+    }
+}
+
 py::list simulate(const simulation::Sweep& sweep,
-                  const LinkOptions& link,
+                  const simulation::LinkOptions& link,
                   const simulation::StopRules& rules,
                   const std::optional<std::pair<std::uint64_t, std::uint64_t>>& frames,
                   bool eachIteration,
                   std::uint64_t seed,
                   unsigned threads,
                   const std::string& instructionSet,
-                  const py::object& progress)
+                  const py::object& progress,
+                  const py::object& warn)
 {
     simulation::Plan plan;
     plan.points = simulation::pointsOf(sweepOf(sweep, link));
@@ -176,28 +185,32 @@ py::list simulate(const simulation::Sweep& sweep,
     plan.version = MORVIK_VERSION;
     const bool isWide = std::any_of(plan.points.begin(), plan.points.end(), simulation::isWide);
     const Listeners listeners = listenersOf(progress, isWide);
-    std::vector<simulation::ResultRow> rows;
+    tell(warn, highRateWarning(plan));
+    std::vector<simulation::PointResult> ended;
     {
         const Unlocked unlocked;
-        rows = errorRates(plan, threads, instructionSet, listeners);
+        ended = errorRates(plan, threads, instructionSet, listeners);
     }
-    return fieldsOf(rows, isWide);
+    if (sweep.milliDecibels.empty()) {
+        tell(warn, unfallenWarning(plan, ended));
+    }
+    return fieldsOf(resultsOf(plan, ended).rows, isWide);
 }
 
 void addLinkOptions(py::module_& module)
 {
-    py::class_<LinkOptions>(module, "LinkOptions")
+    py::class_<simulation::LinkOptions>(module, "LinkOptions")
         .def(py::init<>())
-        .def_readwrite("transport_block_sizes", &LinkOptions::transportBlockSizes)
-        .def_readwrite("coded_bits", &LinkOptions::codedBits)
-        .def_readwrite("code_rates", &LinkOptions::codeRates)
-        .def_readwrite("mcs_indices", &LinkOptions::mcsIndices)
-        .def_readwrite("resource_blocks", &LinkOptions::resourceBlocks)
-        .def_readwrite("resource_elements", &LinkOptions::resourceElements)
-        .def_readwrite("versions", &LinkOptions::versions)
-        .def_readwrite("soft_buffer_bits", &LinkOptions::softBufferBits)
-        .def_readwrite("soft_buffer_size", &LinkOptions::softBufferSize)
-        .def_readwrite("stops_early", &LinkOptions::stopsEarly)
+        .def_readwrite("transport_block_sizes", &simulation::LinkOptions::transportBlockSizes)
+        .def_readwrite("coded_bits", &simulation::LinkOptions::codedBits)
+        .def_readwrite("code_rates", &simulation::LinkOptions::codeRates)
+        .def_readwrite("mcs_indices", &simulation::LinkOptions::mcsIndices)
+        .def_readwrite("resource_blocks", &simulation::LinkOptions::resourceBlocks)
+        .def_readwrite("resource_elements", &simulation::LinkOptions::resourceElements)
+        .def_readwrite("versions", &simulation::LinkOptions::versions)
+        .def_readwrite("soft_buffer_bits", &simulation::LinkOptions::softBufferBits)
+        .def_readwrite("soft_buffer_size", &simulation::LinkOptions::softBufferSize)
+        .def_readwrite("stops_early", &simulation::LinkOptions::stopsEarly)
         .def("set_names",
              setNames,
              py::arg("modulations"),
@@ -225,7 +238,7 @@ void addSimulation(py::module_& module)
                 sweep.axis = isOver ? simulation::Axis::esn0 : simulation::Axis::ebn0;
             });
     addLinkOptions(module);
-    module.attr("most_coded_bits") = mostCodedBits;
+    module.attr("most_coded_bits") = simulation::mostCodedBits;
     py::class_<simulation::StopRules>(module, "StopRules")
         .def(py::init<>())
         .def_readwrite("block_errors", &simulation::StopRules::blockErrors)
@@ -243,7 +256,8 @@ void addSimulation(py::module_& module)
                py::arg("seed"),
                py::arg("threads"),
                py::arg("instruction_set"),
-               py::arg("progress"));
+               py::arg("progress"),
+               py::arg("warn"));
 }
 
 }  // namespace morvik::python

@@ -20,7 +20,7 @@ from morvik import lte, units
 from morvik._checker import Checker
 from morvik._core import __version__
 from morvik._decoder import Decoded, Decoder, instruction_sets
-from morvik._errors import DecoderWarning, Difference, Error
+from morvik._errors import DecoderWarning, Difference, Error, SimulationWarning
 from morvik._link import Streams, awgn, block_sizes, encode, interleaver
 from morvik._simulation import error_rate
 
@@ -31,6 +31,7 @@ __all__ = [
     "DecoderWarning",
     "Difference",
     "Error",
+    "SimulationWarning",
     "Streams",
     "__version__",
     "awgn",

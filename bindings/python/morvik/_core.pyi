@@ -167,4 +167,5 @@ def error_rate(
     threads: int,
     instruction_set: str,
     progress: Callable[[list[dict[str, Any]]], object],
+    warn: Callable[[str], object],
 ) -> list[dict[str, Any]]: ...

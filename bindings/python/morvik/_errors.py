@@ -14,3 +14,9 @@ class DecoderWarning(UserWarning):
     """A warning of the decoder, such as for the first clipped soft value. Each kind comes once in a decoder's life;
     ``warnings.filterwarnings("error", category=morvik.DecoderWarning)`` makes it an exception.
     """
+
+
+class SimulationWarning(UserWarning):
+    """What to know of the results of :func:`morvik.error_rate`: a code rate so high that a terminal may leave out decoding,
+    or curves that have not fallen.
+    """

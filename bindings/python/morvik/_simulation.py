@@ -3,6 +3,7 @@
 from __future__ import annotations
 
 import re
+import warnings
 from collections.abc import Callable, Sequence
 from typing import Any
 
@@ -25,7 +26,7 @@ from morvik._arguments import (
     word,
 )
 from morvik._decoder import Decoder
-from morvik._errors import Error
+from morvik._errors import Error, SimulationWarning
 
 _COUNT_LIMIT = 2**63 - 1
 # The columns of result files; rows of plain code blocks over BPSK have fewer.
@@ -182,6 +183,9 @@ def error_rate(
     ``rates.bler_low`` and ``rates.bler_high`` (bounds of 95 %), ``rates.ber``, ``rates.blocks`` ...
     ``pandas.DataFrame(rates)`` and ``matplotlib.pyplot.semilogy("ebn0_db", "bler", data=rates)`` take it as it is.
 
+    A :class:`SimulationWarning` tells code rates above 0.931, at which a terminal may leave out decoding, and curves that are
+    still above a block error rate of 0.01 at the end of the range that was chosen for them.
+
     The interpreter lock is released meanwhile. Ctrl-C ends the simulation with ``KeyboardInterrupt``.
     """
     if progress is not None and not callable(progress):
@@ -211,6 +215,9 @@ def error_rate(
         if progress is not None:
             progress(_record(point))
 
+    def warn(text: str) -> None:
+        warnings.warn(_with_keywords(text), SimulationWarning, stacklevel=3)
+
     try:
         rows = _core.error_rate(
             sweep,
@@ -222,11 +229,17 @@ def error_rate(
             thread_count(threads),
             instruction_set or "",
             hand_on,
+            warn,
         )
-    except Error as error:  # in the words of the command
-        text = re.sub(r"--([a-z0-9-]+)", lambda option: option[1].replace("-", "_"), str(error))
-        raise Error(text) from None
+    except Error as error:
+        raise Error(_with_keywords(str(error))) from None
     return _record(rows)
+
+
+def _with_keywords(text: str) -> str:
+    """What the command says, with keywords in place of its options."""
+    decibels = re.sub(r"--(e[bs]n0)\b", r"\1_db", text)
+    return re.sub(r"--([a-z0-9-]+)", lambda option: option[1].replace("-", "_"), decibels)
 
 
 def _set_decibels(sweep: _core.Sweep, ebn0_db: Any, esn0_db: Any) -> None:

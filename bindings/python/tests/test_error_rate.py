@@ -6,6 +6,7 @@ import os
 import signal
 import threading
 import time
+import warnings
 
 import matplotlib
 import morvik
@@ -180,6 +181,23 @@ def test_progress_may_end_the_simulation():
     with pytest.raises(KeyError, match="enough"):
         morvik.error_rate(40, [0, 1, 2], progress=stop, **FEW)
     assert len(heard) == 1
+
+
+def test_warns_as_the_command_does():
+    frames = {"transport_block_size": 976, "coded_bits": 1000, "max_blocks": 2}
+    with pytest.warns(morvik.SimulationWarning) as caught:
+        morvik.error_rate(**frames, esn0_db=9)
+    assert [str(each.message) for each in caught] == [
+        "the code rate with CRCs is 1.000 for A = 976, G = 1000: above 0.931, a terminal may leave out decoding "
+        "(3GPP TS 36.213, 7.1.7)"
+    ]
+    assert caught[0].filename == __file__
+    with pytest.warns(morvik.SimulationWarning, match="^a curve ends at a block error rate above 0.01: 1 at Es/N0 .* dB, "
+                      "A = 976, G = 1000, .*; esn0_db or ebn0_db sets the range$"):
+        morvik.error_rate(**frames, channel="block-rayleigh", iterations=1, stop_bler=1)
+    with warnings.catch_warnings():
+        warnings.simplefilter("error")
+        morvik.error_rate(transport_block_size=40, coded_bits=200, esn0_db=-9, max_blocks=2)
 
 
 def test_an_interrupt_ends_the_simulation():
