@@ -1,4 +1,4 @@
-// CSteps: the functions of include/morvik_link.h for single stages of the chain.
+// CStages: the functions of include/morvik_link.h for single stages of the chain.
 #include <algorithm>
 #include <array>
 #include <cmath>

@@ -64,7 +64,7 @@ private:
     unsigned itsDimensions;
     RandomKey itsKey;
     float itsNoiseVariance;
-    float itsNoiseStep;  // the noise of one step of a number
+    float itsNoiseUnit;  // the noise of one step of a number
     NoiseSampler itsSampler;
     std::vector<std::int16_t> itsNumbers;
 };

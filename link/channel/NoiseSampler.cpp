@@ -10,7 +10,7 @@ namespace morvik::link {
 
 namespace {
 
-constexpr int mostSteps = 126;
+constexpr int mostLevel = 126;
 
 /// Numbers that are drawn together, whole groups: few enough to stay in the first-level cache.
 constexpr std::uint32_t partSize = 4096;
@@ -21,7 +21,7 @@ AliasTable::Weights coarseNoise()
 {
     // exp(-d^2 / 2 s^2) for s = 18: each is the one before times r^(2 d - 1) with r = exp(-1 / 2 s^2).
     constexpr double r = 0.99845798025952968374;
-    constexpr unsigned count = mostSteps + 1;
+    constexpr unsigned count = mostLevel + 1;
     std::array<double, count> densities{};
     densities[0] = 1;
     double factor = r;
@@ -35,7 +35,7 @@ AliasTable::Weights coarseNoise()
     constexpr std::uint64_t all = std::uint64_t{1} << AliasTable::weightBits;
     const double unit = static_cast<double>(all) / sum;
     std::uint64_t given = 0;
-    for (unsigned d = mostSteps; d > 0; --d) {
+    for (unsigned d = mostLevel; d > 0; --d) {
         const double exact = densities[d] * unit;
         auto weight = static_cast<std::uint64_t>(exact);
         weight += exact - static_cast<double>(weight) >= 0.5 ? 1U : 0U;
@@ -53,7 +53,7 @@ NoiseSampler::NoiseSampler(const RandomKey& key, const SamplerForm& form)
       itsForm(form),
       itsRefinements(key, form),
       itsNumbers(partSize),
-      itsSteps(partSize),
+      itsLevels(partSize),
       itsUndecided(partSize / 64)
 {
 }
@@ -83,11 +83,11 @@ void NoiseSampler::drawPart(const FrameRandom& random, std::uint32_t first, std:
     const NoiseCounters counters = {random.counterLow(random_index::softValues + first / 8),
                                     random.counterLow(random_index::fineNoise + first / 8),
                                     random.counterHigh()};
-    itsForm.noise(itsTable, itsKey, counters, groups, {itsNumbers.data(), itsSteps.data(), itsUndecided.data()});
+    itsForm.noise(itsTable, itsKey, counters, groups, {itsNumbers.data(), itsLevels.data(), itsUndecided.data()});
     decide(random, first, groups);
 }
 
-/// Decides steps that are an entry's own for now: one in 256. Each has 32 bits of a random block of its own.
+/// Decides levels that are an entry's own for now: one in 256. Each has 32 bits of a random block of its own.
 void NoiseSampler::decide(const FrameRandom& random, std::uint32_t first, std::size_t groups)
 {
     itsOpen.clear();
@@ -102,9 +102,9 @@ void NoiseSampler::decide(const FrameRandom& random, std::uint32_t first, std::s
     itsRefinements.draw();
     for (std::size_t n = 0; n < itsOpen.size(); ++n) {
         const std::uint32_t i = itsOpen[n];
-        const auto entry = static_cast<std::uint8_t>(itsSteps[i]);
+        const auto entry = static_cast<std::uint8_t>(itsLevels[i]);
         if ((itsRefinements.low(n) & 0xFFFFFFFF) >= itsTable.lowThreshold[entry]) {
-            const int change = static_cast<std::int8_t>(itsTable.alias[entry]) - itsSteps[i];
+            const int change = static_cast<std::int8_t>(itsTable.alias[entry]) - itsLevels[i];
             itsNumbers[i] = static_cast<std::int16_t>(itsNumbers[i] + 256 * change);
         }
     }

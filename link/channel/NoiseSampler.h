@@ -17,7 +17,7 @@
 namespace morvik::link {
 
 /// The standard deviation of a number: sqrt(256^2 18^2 + (256^2 - 1) / 6).
-constexpr double noiseSteps = 4609.1850147286927;
+constexpr double noiseDeviation = 4609.1850147286927;
 
 /// The largest absolute value.
 constexpr int mostNoise = 126 * 256 + 255;
@@ -46,7 +46,7 @@ private:
     SamplerForm itsForm;
     RandomBatch itsRefinements;
     std::vector<std::int16_t> itsNumbers;
-    std::vector<std::int8_t> itsSteps;
+    std::vector<std::int8_t> itsLevels;  ///< d
     std::vector<std::uint64_t> itsUndecided;
     std::vector<std::uint32_t> itsOpen;  ///< undecided numbers
 };

@@ -73,14 +73,14 @@ void noiseGeneric(const AliasTable& table,
     constexpr unsigned allBits = 0xFF;
     std::fill_n(drawn.undecided, groups, 0);
     for (std::size_t b = 0; b < 8 * groups; ++b) {
-        std::int8_t* const steps = drawn.steps + 8 * b;
-        const Left8 left = drawBlock(table, randomBlock(key, counters.coarseLow + b, counters.high), allBits, steps);
+        std::int8_t* const levels = drawn.levels + 8 * b;
+        const Left8 left = drawBlock(table, randomBlock(key, counters.coarseLow + b, counters.high), allBits, levels);
         drawn.undecided[b / 8] |= std::uint64_t{left.undecided} << 8 * (b % 8);
         const RandomBlock fine = randomBlock(key, counters.fineLow + b, counters.high);
         for (unsigned i = 0; i < 8; ++i) {
             const auto u = static_cast<int>(fine[i / 4] >> 8 * (i % 4) & 0xFF);
             const auto v = static_cast<int>(fine[2 + i / 4] >> 8 * (i % 4) & 0xFF);
-            drawn.numbers[8 * b + i] = static_cast<std::int16_t>(256 * steps[i] + u + v - 255);
+            drawn.numbers[8 * b + i] = static_cast<std::int16_t>(256 * levels[i] + u + v - 255);
         }
     }
 }

@@ -37,7 +37,7 @@ struct NoiseCounters {
 /// the values of a ValueGroup are, and one of u and v, its bytes 0 to 7 and 8 to 15.
 struct DrawnNoise {
     std::int16_t* numbers;
-    std::int8_t* steps;        ///< d
+    std::int8_t* levels;       ///< d
     std::uint64_t* undecided;  ///< of each group, as above
 };
 

@@ -158,7 +158,7 @@ MORVIK_AVX512 MORVIK_INLINE __m512i countersFrom(std::uint64_t first, __m512i or
 }
 
 /// Numbers of noise. Bytes become words by unpacking, which takes the even and then the odd blocks: so the fine blocks
-/// are drawn, and the steps put, in an order that unpacks to that of the numbers.
+/// are drawn, and the levels put, in an order that unpacks to that of the numbers.
 template <std::size_t count>
 MORVIK_AVX512 MORVIK_INLINE void noiseGroups(const RoundKeys& keys,
                                              const Table512& thresholds,
@@ -179,16 +179,16 @@ MORVIK_AVX512 MORVIK_INLINE void noiseGroups(const RoundKeys& keys,
     for (std::size_t g = 0; g < count; ++g) {
         const auto [values, undecided] = valuesOf(thresholds, aliases, random[2 * g]);
         const Random512& fine = random[2 * g + 1];
-        const __m512i steps = _mm512_permutexvar_epi64(unpacked, values);
+        const __m512i levels = _mm512_permutexvar_epi64(unpacked, values);
         const __m512i less = _mm512_andnot_si512(fine.high, _mm512_set1_epi8(-1));  // 255 - v
         std::int16_t* const numbers = drawn.numbers + 64 * (group + g);
         _mm512_storeu_si512(numbers,
-                            _mm512_sub_epi16(_mm512_unpacklo_epi8(fine.low, steps),
+                            _mm512_sub_epi16(_mm512_unpacklo_epi8(fine.low, levels),
                                              _mm512_unpacklo_epi8(less, _mm512_setzero_si512())));
         _mm512_storeu_si512(numbers + 32,
-                            _mm512_sub_epi16(_mm512_unpackhi_epi8(fine.low, steps),
+                            _mm512_sub_epi16(_mm512_unpackhi_epi8(fine.low, levels),
                                              _mm512_unpackhi_epi8(less, _mm512_setzero_si512())));
-        _mm512_storeu_si512(drawn.steps + 64 * (group + g), values);
+        _mm512_storeu_si512(drawn.levels + 64 * (group + g), values);
         drawn.undecided[group + g] = undecided;
     }
 }
@@ -361,13 +361,13 @@ MORVIK_AVX2 MORVIK_INLINE __m256i countersFrom(std::uint64_t first, __m256i orde
 
 /// Half a group of noise, as above. Returns which values are undecided.
 MORVIK_AVX2 MORVIK_INLINE std::uint64_t noiseHalf(
-    const AliasTable& table, const Random256& coarse, const Random256& fine, std::int16_t* numbers, std::int8_t* steps)
+    const AliasTable& table, const Random256& coarse, const Random256& fine, std::int16_t* numbers, std::int8_t* levels)
 {
     const auto [values, undecided] = valuesOf(table, coarse);
     const __m256i unpacked = _mm256_permute4x64_epi64(values, 0xD8);
     const __m256i zero = _mm256_setzero_si256();
     const __m256i less = _mm256_andnot_si256(fine.high, _mm256_set1_epi8(-1));  // 255 - v
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(steps), values);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(levels), values);
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(numbers),
                         _mm256_sub_epi16(_mm256_unpacklo_epi8(fine.low, unpacked), _mm256_unpacklo_epi8(less, zero)));
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(numbers + 16),
@@ -428,9 +428,9 @@ MORVIK_AVX2 void noiseAvx2(const AliasTable& table,
                               {countersFrom(fine, _mm256_setr_epi64x(4, 6, 5, 7)), high}};
         philox(keys, random);
         std::int16_t* const numbers = drawn.numbers + 64 * g;
-        std::int8_t* const steps = drawn.steps + 64 * g;
-        drawn.undecided[g] = noiseHalf(table, random[0], random[2], numbers, steps) |
-                             noiseHalf(table, random[1], random[3], numbers + 32, steps + 32) << 32;
+        std::int8_t* const levels = drawn.levels + 64 * g;
+        drawn.undecided[g] = noiseHalf(table, random[0], random[2], numbers, levels) |
+                             noiseHalf(table, random[1], random[3], numbers + 32, levels + 32) << 32;
     }
 }
 
