@@ -62,6 +62,7 @@ std::vector<Work> allWork()
         for (const int units : {4, 8}) {
             all.push_back({6144, units, 1, Call::single, sets[lesser]->name, 1});
         }
+        all.push_back({6144, 4, 2, Call::single, sets[lesser]->name, 1});
     }
     for (const int algorithm : {0, 1, 2}) {
         all.push_back({6144, 4, algorithm, Call::single, "component", 1});

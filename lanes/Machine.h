@@ -77,26 +77,27 @@ struct Portable {
     template <unsigned count>
     class Corrections {
     public:
-        explicit MORVIK_INLINE Corrections(const std::uint8_t* entries) : itsEntries(entries) {}
+        explicit MORVIK_INLINE Corrections(const std::uint8_t* entries)
+        {
+            for (int i = 0; i < drops; ++i) {
+                itsDrops[i] = Eighths<count>::of(entries[i] - entries[i + 1]);
+            }
+        }
 
         MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
         {
             const Eighths<count> magnitude = max(difference, Eighths<count>::of(-1) - difference);  // -1 reads as 0
             Eighths<count> sum{};
-            for (int i = 0; i < correctionEntries - 1; ++i) {
-                const Eighths<count> drop = Eighths<count>::of(itsEntries[i] - itsEntries[i + 1]);
-                sum = sum + (drop & below(magnitude, correctionStep * (i + 1)));
+            for (int i = 0; i < drops; ++i) {
+                const Eighths<count> end = Eighths<count>::of(correctionStep * (i + 1));
+                sum = sum + (Eighths<count>{end.v > magnitude.v} & itsDrops[i]);
             }
             return sum;
         }
 
     private:
-        static MORVIK_INLINE Eighths<count> below(Eighths<count> a, int limit)
-        {
-            return {a.v < Eighths<count>::of(limit).v};
-        }
-
-        const std::uint8_t* itsEntries;
+        static constexpr int drops = correctionEntries - 1;
+        Eighths<count> itsDrops[drops];
     };
 
     template <unsigned count>
@@ -144,6 +145,13 @@ struct Sse2 : Portable {
 MORVIK_INLINE Eighths<8> shuffleBytes(Eighths<8> a, Eighths<8> control)
 {
     return {(Raw<8>::Signed)_mm_shuffle_epi8((__m128i)a.v, (__m128i)control.v)};
+}
+
+/// Returns clip(a, lo, hi) - lo. Saturating operations clip; requires a >= hi - 32767.
+MORVIK_INLINE Eighths<8> clippedFrom(int lo, int hi, Eighths<8> a)
+{
+    const __m128i raised = _mm_adds_epi16((__m128i)a.v, (__m128i)Eighths<8>::of(32767 - hi).v);
+    return {(Raw<8>::Signed)_mm_subs_epu16(raised, (__m128i)Eighths<8>::of(32767 - hi + lo).v)};
 }
 
 struct Ssse3 : Sse2 {
@@ -196,8 +204,7 @@ struct Ssse3 : Sse2 {
         MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
         {
             constexpr int reach = correctionEntries * correctionStep;
-            const Eighths<count> index = clip(difference + Eighths<count>::of(reach), 0, 2 * reach - 1);
-            return shuffleBytes(itsEntries, index >> correctionStepBits);
+            return shuffleBytes(itsEntries, clippedFrom(-reach, reach - 1, difference) >> correctionStepBits);
         }
 
     private:
@@ -219,6 +226,12 @@ MORVIK_INLINE Eighths<16> inserted(Eighths<8> a, Eighths<8> b)
 MORVIK_INLINE Eighths<16> shuffleBytes(Eighths<16> a, Eighths<16> control)
 {
     return {(Raw<16>::Signed)_mm256_shuffle_epi8((__m256i)a.v, (__m256i)control.v)};
+}
+
+MORVIK_INLINE Eighths<16> clippedFrom(int lo, int hi, Eighths<16> a)
+{
+    const __m256i raised = _mm256_adds_epi16((__m256i)a.v, (__m256i)Eighths<16>::of(32767 - hi).v);
+    return {(Raw<16>::Signed)_mm256_subs_epu16(raised, (__m256i)Eighths<16>::of(32767 - hi + lo).v)};
 }
 
 struct Avx2 : Ssse3 {
@@ -254,8 +267,9 @@ MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> index)
 
 struct Avx512 : Avx2 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16, 32>;
-    using Kernels = Shapes<Shape<8, 1, 2, 4>, Shape<16, 1, 1, 2>, Shape<32, 1>, Shape<32, 2>>;
     static constexpr bool holdsTwoRecursions = sizeof(void*) == 8;  // 32-bit code has eight registers
+    using Kernels =
+        Shapes<Shape<8, 1, 2, 4>, Shape<16, 1, (holdsTwoRecursions ? 1 : 2), 2>, Shape<32, 1>, Shape<32, 2>>;
 
     /// An index word for each lane.
     template <unsigned count>
