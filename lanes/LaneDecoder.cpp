@@ -185,13 +185,14 @@ void LaneDecoder::prepareStarts(unsigned d)
 template <class Output>
 void LaneDecoder::spread(void (*spreadSlices)(const std::int16_t*, unsigned, Output* const*),
                          const std::int16_t* slices,
-                         Output* const* blocks)
+                         Output* const* blocks) const
 {
-    Output scratch[mostSteps];  // for lanes without a block
+    Output scratch[mostSteps];  // for other lanes
     Output* lanes[mostLanes] = {};
     for (unsigned lane = 0; lane < itsKernel->lanes; ++lane) {
         const LaneStart& start = itsCurrent->tables->laneStart(lane);
-        lanes[lane] = start.block < itsBlocks ? blocks[start.block] + start.position : scratch;
+        Output* const block = start.block < itsBlocks ? blocks[start.block] : nullptr;
+        lanes[lane] = block != nullptr ? block + start.position : scratch;
     }
     spreadSlices(slices, steps(), lanes);
 }
@@ -213,21 +214,18 @@ void LaneDecoder::joint(std::int16_t* const* blocks)
 
 LoadedBlock LaneDecoder::loadedBlock(unsigned block) const
 {
-    const LaneOrder& order = itsCurrent->tables->order();
-    const unsigned vectorLanes = itsKernel->vectorLanes;
-    LoadedBlock streams;
     const Constituent* const constituents = itsCurrent->space.constituent;
-    const std::int16_t* const sources[3] = {constituents[0].systematic, constituents[0].parity, constituents[1].parity};
+    const std::int16_t* const slices[3] = {constituents[0].systematic, constituents[0].parity, constituents[1].parity};
+    LoadedBlock streams;
     for (unsigned s = 0; s < 3; ++s) {
         std::vector<std::int16_t>& values = streams[s];
         values.reserve(itsCut.K() + tailPositions);
-        for (unsigned segment = 0; segment < itsCut.segments(); ++segment) {
-            const unsigned lane = order.lane(block, segment);
-            const std::int16_t* from =
-                sources[s] + std::size_t{lane / vectorLanes} * steps() * vectorLanes + lane % vectorLanes;
-            for (unsigned k = 0; k < steps(); ++k, from += vectorLanes) {
-                values.push_back(*from);
-            }
+        values.resize(itsCut.K());
+        std::int16_t* blocks[mostLanes] = {};
+        blocks[block] = values.data();
+        spread(itsKernel->spreadWords, slices[s], blocks);
+        for (std::int16_t& aligned : values) {
+            aligned = static_cast<std::int16_t>(rules::integerOf(aligned, rules::stateAlignment));
         }
         for (unsigned position = 0; position < tailPositions; ++position) {
             values.push_back(static_cast<std::int16_t>(itsTails[block][3 * position + s]));

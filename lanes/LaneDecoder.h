@@ -102,10 +102,11 @@ private:
                     unsigned s,
                     std::int16_t* slices);
 
+    /// Writes slices to the blocks that are not null.
     template <class Output>
     void spread(void (*spreadSlices)(const std::int16_t*, unsigned, Output* const*),
                 const std::int16_t* slices,
-                Output* const* blocks);
+                Output* const* blocks) const;
 
     const InstructionSet& itsInstructionSet;
     const Algorithm itsAlgorithm;

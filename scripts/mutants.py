@@ -212,7 +212,7 @@ EQUIVALENT = {
         ("no size of a block that is loaded",
          [("itsBlocks = 0;", "itsBlocks = 1;")]),
         ("an element more, and room for it",
-         [("sources[3]", "sources[4]"), ("+ tailPositions);", "- tailPositions);")]),
+         [("slices[3]", "slices[4]"), ("+ tailPositions);", "- tailPositions);")]),
         ("the parity of a pass",
          [("rules::constituentOf(to -", "rules::constituentOf(to +")]),
         ("columns that are handed on before they are read",
