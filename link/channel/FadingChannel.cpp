@@ -24,7 +24,7 @@ int checked(int milliDecibels)
 }
 
 /// What makes the square of a complex Gaussian number one of mean energy 1. The sum of the squares fits in 31 bits.
-constexpr auto energyUnit = static_cast<float>(1 / (2 * noiseDeviation * noiseDeviation));
+constexpr auto energyUnit = static_cast<float>(1 / (2 * levelDeviation * levelDeviation));
 static_assert(std::int64_t{2} * mostNoise * mostNoise <= INT32_MAX);
 
 }  // namespace
@@ -47,7 +47,7 @@ FadingChannel::FadingChannel(
       itsDimensions(dimensions),
       itsKey(key),
       itsNoiseVariance(static_cast<float>(ratioOf(-checked(milliDecibels)))),
-      itsNoiseUnit(static_cast<float>(std::sqrt(ratioOf(-milliDecibels) / 2) / noiseDeviation)),
+      itsNoiseUnit(static_cast<float>(std::sqrt(ratioOf(-milliDecibels) / 2) / levelDeviation)),
       itsSampler(key, form)
 {
 }

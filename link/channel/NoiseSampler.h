@@ -17,7 +17,7 @@
 namespace morvik::link {
 
 /// The standard deviation of a number: sqrt(256^2 18^2 + (256^2 - 1) / 6).
-constexpr double noiseDeviation = 4609.1850147286927;
+constexpr double levelDeviation = 4609.1850147286927;
 
 /// The largest absolute value.
 constexpr int mostNoise = 126 * 256 + 255;

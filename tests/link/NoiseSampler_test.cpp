@@ -56,7 +56,7 @@ TEST(NoiseSamplerTest, CoarseNoiseIsADiscreteGaussian)
     }
     EXPECT_NEAR(variance, 324, 1e-6);
     EXPECT_NEAR(fourth / (324 * 324), 3, 1e-8);
-    EXPECT_NEAR(noiseDeviation * noiseDeviation, 256 * 256 * 324 + (256 * 256 - 1) / 6.0, 1e-5);
+    EXPECT_NEAR(levelDeviation * levelDeviation, 256 * 256 * 324 + (256 * 256 - 1) / 6.0, 1e-5);
 }
 
 TEST_P(EveryNoiseSampler, NumbersAreThoseOfTheDefinition)
@@ -100,7 +100,7 @@ TEST(NoiseSamplerTest, NumbersAreGaussian)
     double squares = 0;
     double fourths = 0;
     for (const std::int16_t number : numbers) {
-        const double x = number / noiseDeviation;
+        const double x = number / levelDeviation;
         sum += x;
         squares += x * x;
         fourths += x * x * x * x;
