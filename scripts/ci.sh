@@ -60,7 +60,7 @@ stage_compilers() {
 }
 
 # The libraries, and the files of tests/data/ with their binary interfaces.
-declare -A interfaces=([morvik_v1_0_bitacc_cmodel]=abi [morvik_link]=abi.link)
+declare -A interfaces=([morvik_v1_0_bitacc_cmodel]=abi [morvik_link]=abi.link [morvik_checker]=abi.checker)
 
 # Compares the binary interfaces with the committed ones, which are stored compressed.
 stage_abi() {
@@ -85,7 +85,7 @@ stage_abi-renew() {
 }
 
 build_abi() {
-    scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel morvik_link_c
+    scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel morvik_link_c morvik_checker_c
 }
 
 # compare_abi BITS LIBRARY FILE
