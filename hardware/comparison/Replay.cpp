@@ -2,24 +2,15 @@
 #include "Replay.h"
 
 #include <cstddef>
-#include <memory>
 
 #include "AlignedWords.h"
 #include "rules/Algorithms.h"
 #include "rules/SoftValues.h"
 #include "rules/Trellis.h"
-#include "src/TCalculationEngineModBase.h"
-#include "src/TNumberFormat.h"
 
 namespace morvik::comparison {
 
 namespace {
-
-std::vector<unsigned char> correctionTable()
-{
-    const std::unique_ptr<TNumberFormat> format(TNumberFormat::create("Fix_12_3"));
-    return TCalculationEngineModBase::createLUT(16, *format);
-}
 
 /// A branch metric or extrinsic value, an aligned word, narrowed to eight bits (rules 5 and 14).
 int narrowed(int value, Mistake mistake)
@@ -96,10 +87,7 @@ std::optional<unsigned> erroneous(const rules::Cut& cut, unsigned address, Addre
 
 }  // namespace
 
-Replay::Replay(const Model& model, const Values& dump)
-    : itsModel(model), itsDump(dump), itsCorrections(correctionTable())
-{
-}
+Replay::Replay(const Model& model, const Values& dump) : itsModel(model), itsDump(dump) {}
 
 Column Replay::column(unsigned pass, Stage stage, unsigned trellisStep, Mistake mistake) const
 {

@@ -5,7 +5,6 @@
 #include <array>
 #include <cstdint>
 #include <optional>
-#include <vector>
 
 #include "Mistake.h"
 #include "Model.h"
@@ -114,7 +113,6 @@ private:
 
     const Model& itsModel;
     const Values& itsDump;
-    std::vector<unsigned char> itsCorrections;  // by decision difference, from -32768
 };
 
 }  // namespace morvik::comparison

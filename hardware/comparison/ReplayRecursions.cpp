@@ -5,6 +5,7 @@
 #include "AlignedWords.h"
 #include "Decisions.h"
 #include "Replay.h"
+#include "hardware/testbench/Corrections.h"
 #include "rules/Starts.h"
 
 namespace morvik::comparison {
@@ -36,17 +37,17 @@ auto withRuleOver(bool isCorrected, const Corrections<Value>& corrections, Use u
 
 /// Calls use(rule, value) with the decision rule and a value of its type.
 template <class Use>
-auto withRule(int algorithm, Mistake mistake, const unsigned char* middle, Use use)
+auto withRule(int algorithm, Mistake mistake, Use use)
 {
     using Word = std::int16_t;
-    const Corrections<Word> corrections{middle, shiftOf(mistake)};
+    const Corrections<Word> table{corrections(), shiftOf(mistake)};
     const bool isCorrected = algorithm == 2 && mistake != Mistake::uncorrected;
     if (isCorrected && mistake == Mistake::correctedAtOnce) {
-        return use(rules::DecideMaxStar<Word, Corrections<Word>>(corrections), Word());
+        return use(rules::DecideMaxStar<Word, Corrections<Word>>(table), Word());
     }
-    return mistake == Mistake::unwrapped ? withRuleOver(isCorrected, Corrections<Held>{middle}, use)
-           : mistake == Mistake::lesser  ? withRuleOver(isCorrected, Corrections<Leaf>{middle}, use)
-                                         : withRuleOver(isCorrected, corrections, use);
+    return mistake == Mistake::unwrapped ? withRuleOver(isCorrected, Corrections<Held>{corrections()}, use)
+           : mistake == Mistake::lesser  ? withRuleOver(isCorrected, Corrections<Leaf>{corrections()}, use)
+                                         : withRuleOver(isCorrected, table, use);
 }
 
 template <class Decision, class Value>
@@ -186,8 +187,7 @@ Replay::Metrics Replay::stepped(const StepInputs& from, Mistake mistake) const
         }
         return words;
     };
-    return withRule(
-        itsModel.generics.C_ALGORITHM_TYPE, mistake, itsCorrections.data() + itsCorrections.size() / 2, advance);
+    return withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, advance);
 }
 
 Replay::Metrics Replay::reached(
@@ -379,8 +379,7 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
         }
         return wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
     };
-    const std::int16_t word =
-        withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, itsCorrections.data() + itsCorrections.size() / 2, ratio);
+    const std::int16_t word = withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, ratio);
     const auto unshifted = static_cast<std::int16_t>(word >> shift);
     return inEighths(registered(std::array<std::int16_t, 1>{unshifted}, mistake), sources);
 }
