@@ -371,13 +371,12 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
             const TreeNode node = treeNodeOf(mistake.number);
             return rules::subWrap(bestWord<1>(rule, forward, backward, branches, node),
                                   bestWord<0>(rule, forward, backward, branches, node));
+        } else {
+            return mistake == Mistake::ratioHeld ? held(wordOf(rules::bestPath<1>(rule, forward, backward, branches)) -
+                                                        wordOf(rules::bestPath<0>(rule, forward, backward, branches)))
+                                                       .value
+                                                 : wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
         }
-        if (mistake == Mistake::ratioHeld) {
-            return held(wordOf(rules::bestPath<1>(rule, forward, backward, branches)) -
-                        wordOf(rules::bestPath<0>(rule, forward, backward, branches)))
-                .value;
-        }
-        return wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
     };
     const std::int16_t word = withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, ratio);
     const auto unshifted = static_cast<std::int16_t>(word >> shift);
