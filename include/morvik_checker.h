@@ -234,12 +234,12 @@ MORVIK_CHECKER_API const char* morvik_checker_situations(morvik_checker* checker
 
 /** Writes them to a file, which appears complete or not at all.
  *
- * @param checker      a checker
- * @param file_name    name of the file, which is replaced
- * @return             MORVIK_CHECKER_AGREES; or MORVIK_CHECKER_REFUSED, and a message says why, or
- *                     MORVIK_CHECKER_OUT_OF_MEMORY
+ * @param checker    a checker
+ * @param file       its name; it is replaced
+ * @return           MORVIK_CHECKER_AGREES; or MORVIK_CHECKER_REFUSED, and a message says why, or
+ *                   MORVIK_CHECKER_OUT_OF_MEMORY
  */
-MORVIK_CHECKER_API int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file_name);
+MORVIK_CHECKER_API int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file);
 
 /** Takes the oldest message from the queue.
  *

@@ -386,15 +386,15 @@ const char* morvik_checker_situations(morvik_checker* checker)
     return checker->text.c_str();
 }
 
-int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file_name)
+int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file)
 {
     return guarded(checker, [&](morvik_checker& each) {
         const Checker& open = openOf(each);
-        if (file_name == nullptr) {
+        if (file == nullptr) {
             throw Wrong{"The file name is a null pointer"};
         }
         try {
-            morvik::base::writeFile(file_name, morvik::coverage::textOf(open.situations()));
+            morvik::base::writeFile(file, morvik::coverage::textOf(open.situations()));
         } catch (const morvik::base::Error& error) {
             throw Wrong{error.what()};
         }

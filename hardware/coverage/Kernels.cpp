@@ -201,7 +201,7 @@ private:
     Word bestPath(const Column& a, const Column& b, const Branches& g, const Place& place)
     {
         const auto see = [this, &place](unsigned node, const auto& c1, const auto& c2) {
-            takeDecided(ratioKernel, c1, c2, Family::tieRatio, (1 - bit) * nodesOfTree + node - 1, place);
+            this->takeDecided(ratioKernel, c1, c2, Family::tieRatio, (1 - bit) * nodesOfTree + node - 1, place);
         };
         WatchedDecision<Rule, decltype(see)> watch(itsRule, true, see);
         watch.restart();
