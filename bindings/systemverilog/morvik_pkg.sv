@@ -266,7 +266,7 @@ package morvik_pkg;
         // The same for all values of SIGNAL_G, SIGNAL_ALPHA or SIGNAL_BETA.
         function int observe_row(int signal, int half_iteration, int step, metrics_t got);
             int answer;
-            if ($isunknown({got[0], got[1], got[2], got[3], got[4], got[5], got[6], got[7]}))
+            if ($isunknown(got[0] ^ got[1] ^ got[2] ^ got[3] ^ got[4] ^ got[5] ^ got[6] ^ got[7]))  // x stays x
                 for (int i = 0; i < 8; i++)
                     if ($isunknown(got[i]))
                         got[i] = VALUE_UNKNOWN;

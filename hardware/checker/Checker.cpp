@@ -81,8 +81,8 @@ template <class Function>
 void Checker::forAllPlaces(Function function) const
 {
     for (unsigned pass = 0; pass < itsPasses; ++pass) {
-        for (unsigned signal = 0; signal < signalCount; ++signal) {
-            for (unsigned step = 0; step < itsSteps; ++step) {
+        for (unsigned step = 0; step < itsSteps; ++step) {
+            for (unsigned signal = 0; signal < signalCount; ++signal) {
                 function(Place{pass, signal, step});
             }
         }

@@ -119,7 +119,7 @@ private:
         return (std::size_t{place.pass} * itsSteps + place.step) * signalCount + place.signal;
     }
 
-    /// Calls a function with each place of the block.
+    /// Calls a function with each place of the block, in the order of the pairs.
     template <class Function>
     void forAllPlaces(Function function) const;
 

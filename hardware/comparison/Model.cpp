@@ -9,21 +9,6 @@
 
 namespace morvik::comparison {
 
-namespace {
-
-void keepPass(const Passes& passes, unsigned pass, Values& values)
-{
-    for (unsigned signal = 0; signal < signalCount; ++signal) {
-        for (unsigned step = 0; step < values.steps(); ++step) {
-            if (passes.isComputed(signal, step)) {
-                values.set({pass, signal, step}, passes.value(signal, step));
-            }
-        }
-    }
-}
-
-}  // namespace
-
 Model computeModel(const SoftBlock& block,
                    const veltra_ip_morvik_v1_0_generics& generics,
                    unsigned iterations,
@@ -33,7 +18,9 @@ Model computeModel(const SoftBlock& block,
     Values values(rules::halfIterations(iterations), passes.cut().K() + rules::tailSteps);
     for (unsigned pass = 0; pass < values.passes(); ++pass) {
         passes.next();
-        keepPass(passes, pass, values);
+        for (unsigned signal = 0; signal < signalCount; ++signal) {
+            passes.copyValues(signal, values.row(pass, signal));
+        }
     }
     const TDecoder3GPU& core = passes.component();
     return {generics,

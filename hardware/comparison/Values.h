@@ -75,6 +75,12 @@ public:
         itsValues[index(place)] = value;
     }
 
+    /// The values of a signal in a half-iteration, by step.
+    std::int16_t* row(unsigned pass, unsigned signal)
+    {
+        return &itsValues[index({pass, signal, 0})];
+    }
+
     /// Copies the values of the signal's twin: they serve as inputs, and are not compared again.
     void copyFromTwin(unsigned signal)
     {

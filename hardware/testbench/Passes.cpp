@@ -9,25 +9,32 @@ namespace morvik {
 
 namespace {
 
-short alignedValue(const TDecoder& decoder, unsigned signal, std::uint32_t step)
+/// Calls visit with the function that gives the signal's aligned value of a step.
+template <class Visit>
+auto visitSignal(const TDecoder& decoder, unsigned signal, Visit visit)
 {
     const Stage stage = stageOf(signal);
     const unsigned number = signal - signalsOf(stage).first;
     switch (stage) {
     case Stage::intrinsic:
-        return decoder.itsIntrinsic[step];
+        return visit([&](std::uint32_t step) { return decoder.itsIntrinsic[step]; });
     case Stage::branch:
-        return decoder.itsGamma[step][number];
+        return visit([&](std::uint32_t step) { return decoder.itsGamma[step][number]; });
     case Stage::forward:
-        return decoder.itsAlpha[step][number];
+        return visit([&](std::uint32_t step) { return decoder.itsAlpha[step][number]; });
     case Stage::backward:
-        return decoder.itsBeta[step][number];
+        return visit([&](std::uint32_t step) { return decoder.itsBeta[step][number]; });
     case Stage::ratio:
-        return decoder.itsLLR[step];
+        return visit([&](std::uint32_t step) { return decoder.itsLLR[step]; });
     case Stage::extrinsic:
         break;
     }
-    return decoder.itsExtrinsic[step];
+    return visit([&](std::uint32_t step) { return decoder.itsExtrinsic[step]; });
+}
+
+std::int16_t integerOf(short aligned)
+{
+    return static_cast<std::int16_t>(rules::integerOf(aligned, rules::stateAlignment));
 }
 
 }  // namespace
@@ -63,12 +70,26 @@ void Passes::next()
 
 std::int16_t Passes::value(unsigned signal, std::uint32_t step) const
 {
-    return static_cast<std::int16_t>(rules::integerOf(alignedValue(itsComponent, signal, step), rules::stateAlignment));
+    return visitSignal(itsComponent, signal, [step](auto alignedAt) { return integerOf(alignedAt(step)); });
+}
+
+void Passes::copyValues(unsigned signal, std::int16_t* values) const
+{
+    visitSignal(itsComponent, signal, [=](auto alignedAt) {
+        for (std::uint32_t step = 0; step < computedSteps(signal); ++step) {
+            values[step] = integerOf(alignedAt(step));
+        }
+    });
 }
 
 bool Passes::isComputed(unsigned signal, std::uint32_t step) const
 {
-    return step < itsCut.K() + stepsAfterBits(stageOf(signal));
+    return step < computedSteps(signal);
+}
+
+std::uint32_t Passes::computedSteps(unsigned signal) const
+{
+    return itsCut.K() + stepsAfterBits(stageOf(signal));
 }
 
 }  // namespace morvik

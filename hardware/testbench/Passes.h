@@ -43,7 +43,12 @@ public:
     /// Whether the core computes the signal at the step (stepsAfterBits). Other values are 0 or meaningless.
     bool isComputed(unsigned signal, std::uint32_t step) const;
 
+    /// Writes all values that the core computes of a signal, by step; much faster than one after the other.
+    void copyValues(unsigned signal, std::int16_t* values) const;
+
 private:
+    std::uint32_t computedSteps(unsigned signal) const;
+
     Decoder itsDecoder;
     TDecoder3GPU& itsComponent;
     rules::Cut itsCut;

@@ -57,7 +57,8 @@ module checker_cost_tb;
 
     parameter int CHECK = 1;
     localparam int clocks = 1_000_000;
-    localparam int steps = 1536;  // those of one of four segments
+    localparam int steps = 1536;           // those of one of four segments
+    localparam int block_clocks = 98_304;  // 16 half-iterations of 6144 steps, if there were one thread alone
 
     bit clk = 0;
     logic signed [7:0] sys, par, apriori, extrinsic;
@@ -73,7 +74,6 @@ module checker_cost_tb;
         stream = new[6148];
         for (int i = 0; i < 6148; i++)
             stream[i] = (37 * i) % 101 - 50;
-        check = new(8, ALGORITHM_SCALED);
         void'(check.start(stream, stream, stream, 8));
         for (int step = 0; step < steps; step++)
             for (int signal = 0; signal < 23; signal++)
@@ -97,9 +97,10 @@ module checker_cost_tb;
     endfunction
 
     initial begin
-        if (CHECK != 0)
-            start();
+        check = new(8, ALGORITHM_SCALED);
         for (int n = 0; n < clocks; n++) begin
+            if (CHECK != 0 && n % block_clocks == 0)
+                start();
             random = random * 1664525 + 1013904223;
             {sys, par, apriori} = random[31:8];
             #1 clk = 1;
