@@ -231,6 +231,7 @@ EQUIVALENT = {
          [("(kernel.lanes /", "(kernel.lanes *"), ("+ fetchAhead)", "- fetchAhead)")]),
         ("border columns have no low bits",
          [("0 ? -1 :", "0 ? -2 :"), ("? -1 : 0;", "? -1 : 1;"), ("- 1 ? -1", "- 1 ? -2")]),
+        ("an element more", [("from[2] =", "from[3] =")]),
     ],
     "lanes/Pass.h": [
         ("room alone",
