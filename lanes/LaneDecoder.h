@@ -81,8 +81,9 @@ private:
     /// The tail values of a block, three streams position by position.
     using TailValues = std::array<int, rules::tailValues>;
 
-    /// The working memory of one kernel, and its tables of the sizes so far. For single blocks, those of all 188 sizes
-    /// take 0.8 to 4 MB in all kernels together; for batches, too, up to 12, 17 and 28 MB with 8, 4 and 2 units.
+    /// The working memory of one kernel, and its tables of the sizes so far. In all kernels of AVX-512 together, those
+    /// of all 188 sizes take 3 MB for single blocks; for batches of any number of blocks 12 to 30 MB, with 8 to 2
+    /// units.
     struct Work {
         std::vector<std::unique_ptr<const SizeTables>> allTables;  ///< [index of the size], where there are some
         const SizeTables* tables = nullptr;                        ///< of the size that the space is laid out for
