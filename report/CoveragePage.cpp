@@ -64,8 +64,8 @@ void writeTable(std::ostream& page, const std::vector<CoverageRow>& rows)
         most = std::max(most, row.count);
     }
     page << "<section>\n<h2 id=\"situations\">Situations</h2>\n"
-            "<label class=\"check\"><input type=\"checkbox\" id=\"only\" autocomplete=\"off\">What is missing "
-            "alone</label>\n"
+            "<label class=\"check\"><input type=\"checkbox\" id=\"only\" autocomplete=\"off\">Show only what is "
+            "missing</label>\n"
             "<div class=\"scroll\">\n<table class=\"situations\" aria-labelledby=\"situations\">\n"
             "<thead><tr><th scope=\"col\">Situation</th><th scope=\"col\">What it is</th>"
             "<th scope=\"col\" colspan=\"2\">Times met</th></tr></thead>\n";
