@@ -160,7 +160,7 @@ protected:
         unsigned saves = 0;
         comesTrue([&] {
             const std::string now = checkpoint();
-            saves += now != last ? 1 : 0;
+            saves += now != last ? 1U : 0U;
             last = now;
             return saves == several || framesCounted() != before;
         });
