@@ -35,6 +35,22 @@ std::string highRateWarning(const Plan& plan)
            ": above 0.931, a terminal may leave out decoding (3GPP TS 36.213, 7.1.7)";
 }
 
+std::string narrowBufferWarning(const Plan& plan)
+{
+    constexpr unsigned enough = 6;  // bits (docs/scale.md)
+    unsigned narrowest = enough;
+    for (const Point& point : plan.points) {
+        const unsigned bits = point.link.softBufferBits;
+        if (!point.scaleOption && bits != 0) {
+            narrowest = std::min(narrowest, bits);
+        }
+    }
+    return narrowest == enough ? ""
+                               : "soft buffers of " + std::to_string(narrowest) +
+                                     " bits saturate with the automatic scale, which suits 6 bits or more; a smaller "
+                                     "scale, such as 2, may decode more blocks";
+}
+
 std::string unfallenWarning(const Plan& plan, const std::vector<PointResult>& ended)
 {
     constexpr double most = 0.01;

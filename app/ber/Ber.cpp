@@ -103,6 +103,7 @@ int simulate(const BerMeans& means, const BerOptions& options, const simulation:
         notice(means.command + ": nothing to resume, starts from the beginning");
     }
     warn(means, highRateWarning(plan));
+    warn(means, narrowBufferWarning(plan));
     bool isComplete = false;
     {
         const auto workers = means.makeWorkers(options, plan);

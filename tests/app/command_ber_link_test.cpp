@@ -263,6 +263,22 @@ TEST_F(BerLink, TellsOfCodeRatesThatATerminalMayLeaveOut)
     EXPECT_EQ(told("--block-size 40"), "");
 }
 
+TEST_F(BerLink, TellsOfSoftBuffersThatTheAutomaticScaleFillsUp)
+{
+    const auto told = [this](const std::string& arguments) {
+        return morvik.run(words("ber --transport-block-size 40 --coded-bits 120 --max-blocks 1 --esn0 9 " + arguments))
+            .err;
+    };
+    EXPECT_EQ(told("--soft-buffer-bits 6"), "");
+    EXPECT_EQ(told("--soft-buffer-bits 5 --scale 2"), "");
+    EXPECT_EQ(told("--soft-buffer-bits 5"),
+              "morvik ber: soft buffers of 5 bits saturate with the automatic scale, which suits 6 bits or more; "
+              "a smaller scale, such as 2, may decode more blocks\n");
+    EXPECT_EQ(told("--soft-buffer-bits 4 --scale auto,2"),
+              "morvik ber: soft buffers of 4 bits saturate with the automatic scale, which suits 6 bits or more; "
+              "a smaller scale, such as 2, may decode more blocks\n");
+}
+
 TEST_F(BerLink, TakesEitherNameOfRedundancyVersions)
 {
     const std::string sizes = "--transport-block-size 40 --coded-bits 120 --esn0 4 --max-blocks 3 ";

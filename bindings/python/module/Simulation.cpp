@@ -186,6 +186,7 @@ py::list simulate(const simulation::Sweep& sweep,
     const bool isWide = std::any_of(plan.points.begin(), plan.points.end(), simulation::isWide);
     const Listeners listeners = listenersOf(progress, isWide);
     tell(warn, highRateWarning(plan));
+    tell(warn, narrowBufferWarning(plan));
     std::vector<simulation::PointResult> ended;
     {
         const Unlocked unlocked;

@@ -183,8 +183,9 @@ def error_rate(
     ``rates.bler_low`` and ``rates.bler_high`` (bounds of 95 %), ``rates.ber``, ``rates.blocks`` ...
     ``pandas.DataFrame(rates)`` and ``matplotlib.pyplot.semilogy("ebn0_db", "bler", data=rates)`` take it as it is.
 
-    A :class:`SimulationWarning` tells code rates above 0.931, at which a terminal may leave out decoding, and curves that are
-    still above a block error rate of 0.01 at the end of the range that was chosen for them.
+    A :class:`SimulationWarning` tells code rates above 0.931, at which a terminal may leave out decoding, soft buffers of less
+    than six bits with the automatic scale, and curves that are still above a block error rate of 0.01 at the end of the range
+    that was chosen for them.
 
     The interpreter lock is released meanwhile. Ctrl-C ends the simulation with ``KeyboardInterrupt``.
     """

@@ -195,6 +195,8 @@ def test_warns_as_the_command_does():
     with pytest.warns(morvik.SimulationWarning, match="^a curve ends at a block error rate above 0.01: 1 at Es/N0 .* dB, "
                       "A = 976, G = 1000, .*; esn0_db or ebn0_db sets the range$"):
         morvik.error_rate(**frames, channel="block-rayleigh", iterations=1, stop_bler=1)
+    with pytest.warns(morvik.SimulationWarning, match="^soft buffers of 4 bits saturate with the automatic scale"):
+        morvik.error_rate(transport_block_size=40, coded_bits=200, esn0_db=9, max_blocks=2, soft_buffer_bits=4)
     with warnings.catch_warnings():
         warnings.simplefilter("error")
         morvik.error_rate(transport_block_size=40, coded_bits=200, esn0_db=-9, max_blocks=2)
