@@ -258,7 +258,7 @@ private:
         for (bool isDropped = true; isDropped;) {
             isDropped = false;
             for (const ChainMistakes& fewer : withoutOne(diagnosis.best.mistakes, itsFormat)) {
-                const ChainAttempt tried = attempt(fewer, signsOf(agreeingValues(itsFormat, itsCases, fewer)));
+                const ChainAttempt tried = attempt(fewer, signsOfAll(agreeingValues(itsFormat, itsCases, fewer)));
                 if (tried.decoded >= diagnosis.best.decoded) {
                     diagnosis.best = tried;
                     diagnosis.attempts.push_back(tried);

@@ -105,7 +105,7 @@ double excess(const Portion& part, const Portion& others)
 
 }  // namespace
 
-Signs signsOf(const std::vector<AgreeingValue>& values)
+Signs signsOfAll(const std::vector<AgreeingValue>& values)
 {
     Signs signs;
     for (const AgreeingValue& each : values) {

@@ -19,7 +19,7 @@ struct UnevenPart {
 };
 
 /// The signs of all values.
-Signs signsOf(const std::vector<AgreeingValue>& values);
+Signs signsOfAll(const std::vector<AgreeingValue>& values);
 
 /// The part that stands out most, if any. `unit` is the value that says a log-likelihood ratio of 1, or 0 where too few
 /// signs are wrong to tell.
