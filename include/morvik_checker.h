@@ -218,17 +218,26 @@ MORVIK_CHECKER_API int32_t morvik_checker_standing(const morvik_checker* checker
  *
  * @param checker    a checker
  * @return           lines, separated by line feeds, valid until the next call with this checker; an empty text without
- *                   a block, after a message. The last line is a summary of morvik_checker_situations
+ *                   a block, after a message. If situations are counted, the last line is a summary of them
  */
 MORVIK_CHECKER_API const char* morvik_checker_report(morvik_checker* checker);
 
-/** Counts the situations of the arithmetic that all blocks of the checker have met: clips, wraps, ties, borders and
- * others at values that have been observed and agree. `morvik coverage` reads such counts, and sums those of several
- * simulations.
+/** Counts situations of the arithmetic from now on: clips, wraps, ties, borders and others at values that have been
+ * observed and agree, of this block, from its start, and of all that follow. Another call changes nothing. Counting
+ * takes longer than observing.
+ *
+ * @param checker    a checker
+ * @return           MORVIK_CHECKER_AGREES; or MORVIK_CHECKER_REFUSED after a message if the configuration was refused,
+ *                   or MORVIK_CHECKER_OUT_OF_MEMORY
+ */
+MORVIK_CHECKER_API int32_t morvik_checker_count_situations(morvik_checker* checker);
+
+/** The situations that have been counted since morvik_checker_count_situations. `morvik coverage` reads such counts,
+ * and sums those of several simulations.
  *
  * @param checker    a checker
  * @return           a CSV file of lines separated by line feeds, valid until the next call with this checker; an empty
- *                   text after a message if the configuration was refused
+ *                   text after a message if they are not counted
  */
 MORVIK_CHECKER_API const char* morvik_checker_situations(morvik_checker* checker);
 
@@ -236,8 +245,8 @@ MORVIK_CHECKER_API const char* morvik_checker_situations(morvik_checker* checker
  *
  * @param checker    a checker
  * @param file       its name; it is replaced
- * @return           MORVIK_CHECKER_AGREES; or MORVIK_CHECKER_REFUSED, and a message says why, or
- *                   MORVIK_CHECKER_OUT_OF_MEMORY
+ * @return           MORVIK_CHECKER_AGREES; or MORVIK_CHECKER_REFUSED after a message, such as if they are not counted,
+ *                   or MORVIK_CHECKER_OUT_OF_MEMORY
  */
 MORVIK_CHECKER_API int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file);
 

@@ -14,6 +14,8 @@
 //     value = $morvik_value(handle, signal, half_iteration, step);            x where the core computes none
 //     ratio = $morvik_ratio(handle, bit);                                     of the last pass
 //     standing = $morvik_report(handle, partial);
+//     $morvik_count_situations(handle);
+//     status = $morvik_write_situations(handle, file);
 //     $morvik_checker_destroy(handle);
 //
 // The units of the core are in Units.cpp.
@@ -348,6 +350,14 @@ int reportBlock(const std::vector<vpiHandle>& arguments)
     return mayBePartial ? MORVIK_CHECKER_AGREES : standing;
 }
 
+int countSituations(const std::vector<vpiHandle>& arguments)
+{
+    morvik_checker* const checker = checkerOf(arguments[0]);
+    const int status = morvik_checker_count_situations(checker);
+    reportMessages(checker);
+    return status;
+}
+
 int writeSituations(const std::vector<vpiHandle>& arguments)
 {
     morvik_checker* const checker = checkerOf(arguments[0]);
@@ -375,6 +385,7 @@ constexpr Call observeCall{"$morvik_observe", "isiiv"};
 constexpr Call valueCall{"$morvik_value", "isii"};
 constexpr Call ratioCall{"$morvik_ratio", "ii"};
 constexpr Call reportCall{"$morvik_report", "ii"};
+constexpr Call countSituationsCall{"$morvik_count_situations", "i"};
 constexpr Call writeSituationsCall{"$morvik_write_situations", "is"};
 constexpr Call destroyCheckerCall{"$morvik_checker_destroy", "i"};
 
@@ -470,6 +481,7 @@ void announceAll()
     announce(valueCall, vpiSysFunc, run<value, MORVIK_CHECKER_UNKNOWN, true>);
     announce(ratioCall, vpiSysFunc, run<ratio, MORVIK_CHECKER_UNKNOWN, true>);
     announce(reportCall, vpiSysFunc, run<reportBlock, MORVIK_CHECKER_REFUSED, true>);
+    announce(countSituationsCall, vpiSysTask, run<countSituations, 0, false>);
     announce(writeSituationsCall, vpiSysFunc, run<writeSituations, MORVIK_CHECKER_REFUSED, true>);
     announce(destroyCheckerCall, vpiSysTask, run<destroyChecker, 0, false>);
     announceUnits();

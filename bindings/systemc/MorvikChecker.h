@@ -131,8 +131,15 @@ public:
         return isPartial ? MORVIK_CHECKER_AGREES : standing;
     }
 
-    /// Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`. Returns
-    /// MORVIK_CHECKER_AGREES, or MORVIK_CHECKER_REFUSED after an error if the file cannot be written.
+    /// Counts from now on how often values that are right meet each situation of the arithmetic, those of this block
+    /// included. This takes longer than observing them.
+    void countSituations()
+    {
+        answered(morvik_checker_count_situations(itsChecker.get()));
+    }
+
+    /// Writes these counts, for `morvik coverage`. Returns MORVIK_CHECKER_AGREES, or MORVIK_CHECKER_REFUSED after an
+    /// error if there are none or the file cannot be written.
     int writeSituations(const std::string& fileName)
     {
         return answered(morvik_checker_write_situations(itsChecker.get(), fileName.c_str()));

@@ -112,6 +112,10 @@ void checkChecker()
     expectAnswer(one.report(), MORVIK_CHECKER_INCOMPLETE, "morvik: ERROR:checker:Values are missing");
     expectAnswer(one.writeSituations("/nowhere/met.csv"),
                  MORVIK_CHECKER_REFUSED,
+                 "morvik: ERROR:checker:Situations are counted only if count_situations asks for it");
+    one.countSituations();
+    expectAnswer(one.writeSituations("/nowhere/met.csv"),
+                 MORVIK_CHECKER_REFUSED,
                  "morvik: ERROR:checker:/nowhere/met.csv: cannot be written: No such file or directory");
     expectAnswer(
         one.observe(MORVIK_CHECKER_LLR, 1, 4, sc_dt::sc_lv<12>("0000000x0000")),

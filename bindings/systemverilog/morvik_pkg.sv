@@ -38,6 +38,7 @@ package morvik_pkg;
     import "DPI-C" function int morvik_checker_expected(input chandle handle, input int signal);
     import "DPI-C" function int morvik_checker_standing(input chandle handle);
     import "DPI-C" function string morvik_checker_report(input chandle handle);
+    import "DPI-C" function int morvik_checker_count_situations(input chandle handle);
     import "DPI-C" function int morvik_checker_write_situations(input chandle handle, input string file_name);
     import "DPI-C" function string morvik_checker_message(input chandle handle);
 
@@ -321,8 +322,14 @@ package morvik_pkg;
             return answer;
         endfunction
 
-        // Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`. Returns
-        // CHECKER_AGREES, or CHECKER_REFUSED after an error if the file cannot be written.
+        // Counts from now on how often values that are right meet each situation of the arithmetic, those of this block
+        // included. This takes longer than observing them.
+        function void count_situations();
+            void'(answered(morvik_checker_count_situations(handle)));
+        endfunction
+
+        // Writes these counts, for `morvik coverage`. Returns CHECKER_AGREES, or CHECKER_REFUSED after an error if there are
+        // none or the file cannot be written.
         function int write_situations(string file_name);
             return answered(morvik_checker_write_situations(handle, file_name));
         endfunction

@@ -89,7 +89,11 @@ package morvik_checker_pkg is
         partial  : in  boolean := false
     );
 
-    -- Writes how often all blocks so far have met each situation of the arithmetic, for `morvik coverage`.
+    -- Counts from now on how often values that are right meet each situation of the arithmetic, those of this block
+    -- included. This takes longer than observing them.
+    procedure morvik_count_situations (checker : in integer);
+
+    -- Writes these counts, for `morvik coverage`, or reports with severity error if there are none.
     procedure morvik_write_situations (checker : in integer; file_name : in string);
 
     -- Releases a checker. An unknown number is ignored.
@@ -111,6 +115,7 @@ package morvik_checker_pkg is
     impure function morvik_vhdl_checker_ratio (checker, position : integer) return integer;
     impure function morvik_vhdl_checker_standing (checker : integer) return integer;
     impure function morvik_vhdl_checker_report (checker : integer) return integer;
+    impure function morvik_vhdl_checker_count_situations (checker : integer) return integer;
     impure function morvik_vhdl_checker_situations (checker : integer) return integer;
     impure function morvik_vhdl_checker_message (checker : integer) return integer;
 
@@ -126,6 +131,7 @@ package morvik_checker_pkg is
     attribute foreign of morvik_vhdl_checker_ratio : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_ratio";
     attribute foreign of morvik_vhdl_checker_standing : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_standing";
     attribute foreign of morvik_vhdl_checker_report : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_report";
+    attribute foreign of morvik_vhdl_checker_count_situations : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_count_situations";
     attribute foreign of morvik_vhdl_checker_situations : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_situations";
     attribute foreign of morvik_vhdl_checker_message : function is "VHPIDIRECT libmorvik_vhdl.so morvik_vhdl_checker_message";
 
@@ -306,6 +312,11 @@ package body morvik_checker_pkg is
         standing := result;
     end procedure morvik_report;
 
+    procedure morvik_count_situations (checker : in integer) is
+    begin
+        pass_on(checker, morvik_vhdl_checker_count_situations(checker));
+    end procedure morvik_count_situations;
+
     procedure morvik_write_situations (checker : in integer; file_name : in string) is
         file counts : std.textio.text;
         variable opened : file_open_status;
@@ -408,6 +419,12 @@ package body morvik_checker_pkg is
         report "morvik_vhdl_checker_report is foreign" severity failure;
         return 0;
     end function morvik_vhdl_checker_report;
+
+    impure function morvik_vhdl_checker_count_situations (checker : integer) return integer is
+    begin
+        report "morvik_vhdl_checker_count_situations is foreign" severity failure;
+        return 0;
+    end function morvik_vhdl_checker_count_situations;
 
     impure function morvik_vhdl_checker_situations (checker : integer) return integer is
     begin

@@ -249,6 +249,11 @@ MORVIK_API std::int32_t morvik_vhdl_checker_report(std::int32_t checker)
     return take(morvik_checker_report(findChecker(checker)));
 }
 
+MORVIK_API std::int32_t morvik_vhdl_checker_count_situations(std::int32_t checker)
+{
+    return morvik_checker_count_situations(findChecker(checker));
+}
+
 MORVIK_API std::int32_t morvik_vhdl_checker_situations(std::int32_t checker)
 {
     return take(morvik_checker_situations(findChecker(checker)));

@@ -47,6 +47,20 @@ struct Wrong {
     std::string what;
 };
 
+using Rows = std::array<morvik::SignalRange, morvik::signalCount>;
+
+/// The row of each signal.
+constexpr Rows rowsOfSignals()
+{
+    Rows rows{};
+    for (unsigned signal = 0; signal < morvik::signalCount; ++signal) {
+        rows[signal] = morvik::signalsOf(morvik::stageOf(signal));
+    }
+    return rows;
+}
+
+constexpr Rows rowOf = rowsOfSignals();
+
 /// What waits to be taken. A caller who never asks keeps the first ones.
 constexpr std::size_t mostMessages = 1000;
 
@@ -101,6 +115,15 @@ Checker& startedOf(morvik_checker& checker)
     return open;
 }
 
+const Checker& countingOf(morvik_checker& checker)
+{
+    const Checker& open = openOf(checker);
+    if (!open.countsSituations()) {
+        throw Wrong{"Situations are counted only if count_situations asks for it"};
+    }
+    return open;
+}
+
 [[noreturn]] void failOutside(const std::string& what, std::int32_t given, unsigned count)
 {
     throw Wrong{what + ' ' + std::to_string(given) + " is not allowed, expected 0 to " + std::to_string(count - 1)};
@@ -121,32 +144,34 @@ Place placeOf(const Checker& checker, std::int32_t signal, std::int32_t pass, st
             below("Step", step, checker.steps())};
 }
 
-std::int16_t valueOf(const Place& place, std::int32_t given)
+[[noreturn]] void failBeyondRegister(unsigned signal, std::int32_t given)
 {
+    throw Wrong{std::string(morvik::passSignals[signal].name) + " " + std::to_string(given) +
+                " is not allowed, expected -2048 to 2047: eighths, a register's bits in two's complement, "
+                "sign-extended"};
+}
+
+std::int16_t valueOf(unsigned signal, std::int32_t given)
+{
+    if (given >= Values::smallest && given <= Values::largest) {
+        return static_cast<std::int16_t>(given);
+    }
     if (given == MORVIK_CHECKER_UNKNOWN) {
         return Values::unknown;
     }
-    if (given < Values::smallest || given > Values::largest) {
-        throw Wrong{std::string(morvik::passSignals[place.signal].name) + " " + std::to_string(given) +
-                    " is not allowed, expected -2048 to 2047: eighths, a register's bits in two's complement, "
-                    "sign-extended"};
-    }
-    return static_cast<std::int16_t>(given);
+    failBeyondRegister(signal, given);
 }
 
 /// Observes the values of consecutive signals, and tells of the block's first difference.
-std::int32_t observe(morvik_checker& checker, Place place, unsigned count, const std::int32_t* given)
+std::int32_t observe(morvik_checker& checker, const Place& place, unsigned count, const std::int32_t* given)
 {
     Checker& started = *checker.checker;
     std::array<std::int16_t, 8> values{};
     for (unsigned i = 0; i < count; ++i) {
-        values[i] = valueOf({place.pass, place.signal + i, place.step}, given[i]);
+        values[i] = valueOf(place.signal + i, given[i]);
     }
     const bool agreed = started.differences() == 0;
-    bool agrees = true;
-    for (unsigned i = 0; i < count; ++i, ++place.signal) {
-        agrees = started.observe(place, values[i]) && agrees;
-    }
+    const bool agrees = started.observe(place, values.data(), count);
     if (agreed && !agrees) {
         queue(checker, "ERROR:checker:" + started.headline() + '\n' + withoutLastLineFeeds(started.firstDifference()));
     }
@@ -248,13 +273,13 @@ int32_t morvik_checker_start(morvik_checker* checker, int32_t iterations)
 
 void morvik_checker_forget(morvik_checker* checker)
 {
-    if (checker == nullptr) {
-        return;
-    }
-    forgetPositions(*checker);
-    if (checker->checker) {
-        checker->checker->forget();
-    }
+    guarded(checker, [](morvik_checker& each) {
+        forgetPositions(each);
+        if (each.checker) {
+            each.checker->forget();
+        }
+        return MORVIK_CHECKER_AGREES;
+    });
 }
 
 int32_t morvik_checker_signal(const char* name)
@@ -281,7 +306,7 @@ int32_t morvik_checker_observe_row(
 {
     return guarded(checker, [=](morvik_checker& each) {
         const Place place = placeOf(startedOf(each), signal, half_iteration, step);
-        const auto [first, count] = morvik::signalsOf(morvik::stageOf(place.signal));
+        const auto [first, count] = rowOf[place.signal];
         if (place.signal != first) {
             throw Wrong{std::string(morvik::passSignals[place.signal].name) + " is not the first of its row, " +
                         morvik::passSignals[first].name};
@@ -373,6 +398,14 @@ const char* morvik_checker_report(morvik_checker* checker)
     return checker->text.c_str();
 }
 
+int32_t morvik_checker_count_situations(morvik_checker* checker)
+{
+    return guarded(checker, [](morvik_checker& each) {
+        openOf(each).countSituations();
+        return MORVIK_CHECKER_AGREES;
+    });
+}
+
 const char* morvik_checker_situations(morvik_checker* checker)
 {
     if (checker == nullptr) {
@@ -380,7 +413,7 @@ const char* morvik_checker_situations(morvik_checker* checker)
     }
     checker->text.clear();
     guarded(checker, [](morvik_checker& each) {
-        each.text = morvik::coverage::textOf(openOf(each).situations());
+        each.text = morvik::coverage::textOf(countingOf(each).situations());
         return MORVIK_CHECKER_AGREES;
     });
     return checker->text.c_str();
@@ -389,12 +422,12 @@ const char* morvik_checker_situations(morvik_checker* checker)
 int32_t morvik_checker_write_situations(morvik_checker* checker, const char* file)
 {
     return guarded(checker, [&](morvik_checker& each) {
-        const Checker& open = openOf(each);
+        const Checker& counting = countingOf(each);
         if (file == nullptr) {
             throw Wrong{"The file name is a null pointer"};
         }
         try {
-            morvik::base::writeFile(file, morvik::coverage::textOf(open.situations()));
+            morvik::base::writeFile(file, morvik::coverage::textOf(counting.situations()));
         } catch (const morvik::base::Error& error) {
             throw Wrong{error.what()};
         }

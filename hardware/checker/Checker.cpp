@@ -47,9 +47,6 @@ Checker::Checker(const veltra_ip_morvik_v1_0_generics& generics) : itsGenerics(g
 {
     std::ostringstream warnings;
     const Decoder allowed(generics, warnings);
-    coverage::CoreCounts none;
-    none.core = coverage::coreOf(generics);
-    itsSituations.add(none);
 }
 
 void Checker::start(const SoftBlock& block, unsigned iterations, std::ostream& warnings)
@@ -69,7 +66,9 @@ void Checker::start(const SoftBlock& block, unsigned iterations, std::ostream& w
 
 void Checker::forget()
 {
-    itsSituations = situations();
+    if (itsSituations) {
+        itsSituations = situations();
+    }
     itsModel.reset();
     itsPasses = 0;
     itsSteps = 0;
@@ -138,9 +137,20 @@ bool Checker::isRight(const Place& place) const
     return is(place) || is({place.pass, comparison::twinOf(place.signal), place.step});
 }
 
+void Checker::countSituations()
+{
+    if (!itsSituations) {
+        coverage::CoreCounts none;
+        none.core = coverage::coreOf(itsGenerics);
+        coverage::Counts counts;
+        counts.add(none);
+        itsSituations = std::move(counts);
+    }
+}
+
 coverage::Counts Checker::situations() const
 {
-    coverage::Counts sum = itsSituations;
+    coverage::Counts sum = *itsSituations;
     const std::uint64_t observed = std::accumulate(itsCounts.begin(), itsCounts.end(), std::uint64_t{0});
     if (observed > itsDifferences) {
         coverage::CoreCounts counts;
@@ -168,10 +178,14 @@ std::string Checker::report() const
     if (std::all_of(itsCounts.begin(), itsCounts.end(), [](std::uint32_t count) { return count == 0; })) {
         return name() + ": nothing has been observed\n";
     }
-    const coverage::Counts counts = situations();
-    constexpr std::size_t namesNone = 0;
-    return formatted(comparison::textOf) + "situations: " + coverage::summary(counts, namesNone) + ", in " +
-           base::counted(counts.blocks(), "block") + '\n';
+    std::string text = formatted(comparison::textOf);
+    if (itsSituations) {
+        const coverage::Counts counts = situations();
+        constexpr std::size_t namesNone = 0;
+        text += "situations: " + coverage::summary(counts, namesNone) + ", in " +
+                base::counted(counts.blocks(), "block") + '\n';
+    }
+    return text;
 }
 
 }  // namespace morvik::checker

@@ -44,7 +44,7 @@ public:
     /// block then.
     void start(const SoftBlock& block, unsigned iterations, std::ostream& warnings);
 
-    /// Ends the block, of which nothing is known any more but the situations that it has met.
+    /// Ends the block, of which nothing is known any more but the situations that it has met, if they are counted.
     void forget();
 
     bool hasBlock() const
@@ -70,20 +70,17 @@ public:
         return wanted == Values::missing ? std::nullopt : std::optional(wanted);
     }
 
-    /// Takes a value, or Values::unknown, and tells whether it agrees. The place must be one of the block. Where the
-    /// core computes nothing, everything agrees. Of several values observed at a place, the first wrong one stays.
-    bool observe(const Place& place, std::int16_t value)
+    /// Takes the values of `count` signals from a place on, each of them known or Values::unknown, and tells whether
+    /// all agree. The places must be of the block. Where the core computes nothing, everything agrees. Of several
+    /// values observed at a place, the first wrong one stays.
+    bool observe(const Place& first, const std::int16_t* values, unsigned count)
     {
-        Pair& pair = itsPairs[index(place)];
-        if (pair.wanted == Values::missing) {
-            return true;
+        Pair* const pairs = &itsPairs[index(first)];
+        bool agrees = true;
+        for (unsigned i = 0; i < count; ++i) {
+            agrees = observe(pairs[i], itsCounts[first.signal + i], values[i]) && agrees;
         }
-        itsCounts[place.signal] += pair.got == Values::missing ? 1U : 0U;
-        if (pair.got == Values::missing || pair.got == pair.wanted) {
-            pair.got = value;
-            itsDifferences += value == pair.wanted ? 0U : 1U;
-        }
-        return value == pair.wanted;
+        return agrees;
     }
 
     /// Places with a wrong value.
@@ -99,11 +96,21 @@ public:
     std::string headline() const;
     std::string firstDifference() const;
 
-    /// What has been compared, what has not, all differences, and a line about situations(). There must be a block.
+    /// What has been compared, what has not, all differences, and a line about situations() if they are counted. There
+    /// must be a block.
     std::string report() const;
 
-    /// The situations of the arithmetic that all blocks so far have met, as far as it was observed: those at values
-    /// that were observed and are right.
+    /// Counts situations from now on, also those of values of this block that were observed before. It takes longer
+    /// than all else that is done for a value, so nobody pays for it who does not ask.
+    void countSituations();
+
+    bool countsSituations() const
+    {
+        return itsSituations.has_value();
+    }
+
+    /// The situations of the arithmetic that all blocks have met since countSituations(), as far as it was observed:
+    /// those at values that were observed and are right. They must be counted.
     coverage::Counts situations() const;
 
 private:
@@ -112,6 +119,19 @@ private:
         std::int16_t wanted;
         std::int16_t got;
     };
+
+    bool observe(Pair& pair, std::uint32_t& count, std::int16_t value)
+    {
+        if (pair.wanted == Values::missing) {
+            return true;
+        }
+        count += pair.got == Values::missing ? 1U : 0U;
+        if (pair.got == Values::missing || pair.got == pair.wanted) {
+            pair.got = value;
+            itsDifferences += value == pair.wanted ? 0U : 1U;
+        }
+        return value == pair.wanted;
+    }
 
     /// Those of a step are neighbours, as they are observed together.
     std::size_t index(const Place& place) const
@@ -131,8 +151,8 @@ private:
     std::string formatted(Format format) const;
 
     veltra_ip_morvik_v1_0_generics itsGenerics;
-    std::uint64_t itsBlocks = 0;     ///< started
-    coverage::Counts itsSituations;  ///< of the blocks before
+    std::uint64_t itsBlocks = 0;                    ///< started
+    std::optional<coverage::Counts> itsSituations;  ///< of the blocks before, if they are counted
     std::optional<comparison::Model> itsModel;
     unsigned itsPasses = 0;
     unsigned itsSteps = 0;

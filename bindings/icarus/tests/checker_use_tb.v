@@ -19,6 +19,7 @@ module checker_use_tb;
         answer = $morvik_observe(one, "llr", 0, 0, 0);
         $display("order, answer %0d", answer);
         one = $morvik_checker_create(2, 1);
+        $morvik_count_situations(one);
         answer = $morvik_observe(one, "llr", 0, 0, 0);
         i = $morvik_ratio(one, 0);
         $display("ratio %0d", i);
@@ -62,6 +63,10 @@ module checker_use_tb;
         answer = $morvik_observe(one, "llr", 0, 0, 0);
         $morvik_checker_destroy(one);
         $display("situations");
+        $morvik_count_situations(one);
+        answer = $morvik_write_situations(other, "/nowhere/met.csv");
+        $display("answer %0d, not counted", answer);
+        $morvik_count_situations(other);
         answer = $morvik_write_situations(other, "/nowhere/met.csv");
         $display("answer %0d, written %0d", answer, $morvik_write_situations(other, "/dev/null"));
     end

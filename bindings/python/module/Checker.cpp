@@ -38,7 +38,7 @@ std::optional<int> known(std::int32_t value)
 class Checker {
 public:
     /// Throws Refusal.
-    Checker(std::int32_t numPu, std::int32_t algorithm)
+    Checker(std::int32_t numPu, std::int32_t algorithm, bool countsSituations)
     {
         takeMessages();  // left from a call that ended with an exception
         itsChecker.reset(morvik_checker_create(numPu, algorithm));
@@ -47,6 +47,9 @@ public:
         }
         if (morvik_checker_is_open(itsChecker.get()) == 0) {
             throw Refusal(takeMessages().error);
+        }
+        if (countsSituations) {
+            expectTaken(morvik_checker_count_situations(itsChecker.get()));
         }
     }
 
@@ -121,16 +124,13 @@ public:
     /// Throws Refusal.
     std::string report()
     {
-        std::string text = morvik_checker_report(itsChecker.get());
-        if (text.empty()) {
-            throw Refusal(message());
-        }
-        return text;
+        return given(morvik_checker_report(itsChecker.get()));
     }
 
+    /// Throws Refusal.
     std::string situations()
     {
-        return morvik_checker_situations(itsChecker.get());
+        return given(morvik_checker_situations(itsChecker.get()));
     }
 
 private:
@@ -144,6 +144,15 @@ private:
     std::string message()
     {
         return withoutPrefix(morvik_checker_message(itsChecker.get()));
+    }
+
+    /// The text, unless it is empty, as after a refusal.
+    std::string given(std::string text)
+    {
+        if (text.empty()) {
+            throw Refusal(message());
+        }
+        return text;
     }
 
     void expectTaken(std::int32_t answer)
@@ -170,7 +179,10 @@ void addChecker(py::module_& module)
     }
     module.attr("signals") = names;
     py::class_<Checker> checker(module, "Checker");
-    checker.def(py::init<std::int32_t, std::int32_t>(), py::arg("num_pu"), py::arg("algorithm"));
+    checker.def(py::init<std::int32_t, std::int32_t, bool>(),
+                py::arg("num_pu"),
+                py::arg("algorithm"),
+                py::arg("count_situations"));
     checker.def("start",
                 &Checker::start,
                 py::arg("sys").noconvert(),

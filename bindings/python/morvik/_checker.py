@@ -31,6 +31,8 @@ class Checker:
 
     ``num_pu``, ``algorithm``
         As for :class:`morvik.Decoder`.
+    ``count_situations``
+        Whether :meth:`situations` are counted, which takes longer than observing values.
 
     Signals are ``"intrinsic"``, ``"g0"`` to ``"g3"``, ``"alpha0"`` to ``"alpha7"``, ``"beta0"`` to ``"beta7"``,
     ``"llr"`` and ``"extrinsic"``. Half-iterations and steps count from 0, steps in the order of the code that is decoded.
@@ -39,8 +41,14 @@ class Checker:
     A refusal raises :class:`morvik.Error`.
     """
 
-    def __init__(self, num_pu: int = DEFAULT_NUM_PU, algorithm: str | int = DEFAULT_ALGORITHM) -> None:
-        self._core = _core.Checker(word("num_pu", num_pu, -1, 99), algorithm_number(algorithm))
+    def __init__(
+        self,
+        num_pu: int = DEFAULT_NUM_PU,
+        algorithm: str | int = DEFAULT_ALGORITHM,
+        *,
+        count_situations: bool = False,
+    ) -> None:
+        self._core = _core.Checker(word("num_pu", num_pu, -1, 99), algorithm_number(algorithm), bool(count_situations))
         self._half_iterations = 0
 
     def start(
@@ -108,7 +116,7 @@ class Checker:
 
     def situations(self) -> str:
         """How often all blocks so far have met each situation of the arithmetic, at values that were observed and agree:
-        the text of a CSV file, which ``morvik coverage`` reads."""
+        the text of a CSV file, which ``morvik coverage`` reads. Only with ``count_situations=True``."""
         return self._core.situations()
 
     def __reduce__(self) -> NoReturn:

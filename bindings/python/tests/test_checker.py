@@ -75,7 +75,10 @@ def test_blocks_and_checkers_are_independent(soft, checker):
     assert checker.report() == "block 1: nothing has been observed"
 
 
-def test_situations_are_those_of_all_blocks(block, checker):
+def test_situations_are_those_of_all_blocks(block):
+    checker = morvik.Checker(count_situations=True)
+    checker.start(*block, iterations=2)
+
     def counts():
         rows = [line.split(",") for line in checker.situations().splitlines()[1:]]
         return {situation: int(count) for _, _, situation, count in rows}
@@ -88,6 +91,13 @@ def test_situations_are_those_of_all_blocks(block, checker):
         assert counts()["pass.later.natural"] == 40 * time
         assert f"situations: {sum(map(bool, counts().values())) - 1} of 130 met, in {time} block" in checker.report()
         checker.start(*block, iterations=2)
+
+
+def test_situations_are_counted_only_when_asked_for(checker):
+    assert checker.observe("llr", 3, 0, checker.ratios()[0])
+    assert "situations" not in checker.report()
+    with pytest.raises(morvik.Error, match="counted only if count_situations asks for it"):
+        checker.situations()
 
 
 def test_refusals(block, checker):

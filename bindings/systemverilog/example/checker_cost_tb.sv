@@ -1,5 +1,6 @@
 // checker_cost_tb: what a checker costs beside the simulation of a datapath. With CHECK = 1, it takes all 23 values of a
-// trellis step in each clock; with CHECK = 0, the datapath runs alone. docs/checker.md has the commands.
+// trellis step in each clock; with CHECK = 2, it counts situations, too; with CHECK = 0, the datapath runs alone.
+// docs/checker.md has the commands.
 
 // About what one thread of a unit computes in a clock: branch metrics, a step of each recursion, a ratio and an extrinsic
 // value, with the memories of a window. The trellis is not that of the code.
@@ -75,6 +76,10 @@ module checker_cost_tb;
         for (int i = 0; i < 6148; i++)
             stream[i] = (37 * i) % 101 - 50;
         void'(check.start(stream, stream, stream, 8));
+    endfunction
+
+    // Once, as each block is the same one.
+    function automatic void take_values();
         for (int step = 0; step < steps; step++)
             for (int signal = 0; signal < 23; signal++)
                 values[step][signal] = check.value(signal, 0, step);
@@ -98,9 +103,13 @@ module checker_cost_tb;
 
     initial begin
         check = new(8, ALGORITHM_SCALED);
+        if (CHECK == 2)
+            check.count_situations();
         for (int n = 0; n < clocks; n++) begin
             if (CHECK != 0 && n % block_clocks == 0)
                 start();
+            if (CHECK != 0 && n == 0)
+                take_values();
             random = random * 1664525 + 1013904223;
             {sys, par, apriori} = random[31:8];
             #1 clk = 1;

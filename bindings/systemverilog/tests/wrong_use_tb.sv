@@ -134,6 +134,9 @@ module wrong_use_tb;
         expect_answer(check, check.report(1), CHECKER_AGREES, "");
         expect_answer(check, check.report(), CHECKER_INCOMPLETE, "ERROR:checker:Values are missing");
         expect_answer(check, check.write_situations("/nowhere/met.csv"), CHECKER_REFUSED,
+            "ERROR:checker:Situations are counted only if count_situations asks for it");
+        check.count_situations();
+        expect_answer(check, check.write_situations("/nowhere/met.csv"), CHECKER_REFUSED,
             "ERROR:checker:/nowhere/met.csv: cannot be written: No such file or directory");
         other = new(8);
         expect_answer(other, other.start(values(44), values(44), values(44), 1), CHECKER_AGREES, "");

@@ -95,7 +95,10 @@ begin
         assert morvik_integer("1000") = -8 and morvik_integer("0111") = 7 severity failure;
 
         report "situations";
+        morvik_count_situations(one);
         morvik_write_situations(one, "checker_use_situations.csv");
+        morvik_write_situations(other, "checker_use_situations.csv");
+        morvik_count_situations(other);
         morvik_write_situations(other, "/nowhere/met.csv");
         morvik_write_situations(other, "checker_use_situations.csv");
         std.textio.file_open(counts, "checker_use_situations.csv", read_mode);

@@ -32,6 +32,14 @@ Checker started(unsigned seed = 1)
     return checker;
 }
 
+/// The same, counting situations.
+Checker counting(unsigned seed = 1)
+{
+    Checker checker = started(seed);
+    EXPECT_EQ(morvik_checker_count_situations(checker.get()), MORVIK_CHECKER_AGREES);
+    return checker;
+}
+
 /// All values of a signal in all half-iterations, as the core has them.
 void observeAll(const Checker& checker, int signal)
 {
@@ -176,8 +184,7 @@ TEST(Checker, CountsWhatItHasSeen)
                  "\n"
                  "signal      compared  missing  unknown  differences   faults   first difference\n"
                  "intrinsic          1      171        0            0        0\n"
-                 "llr              160        0        0            0        0\n"
-                 "situations: 23 of 130 met, in 1 block");
+                 "llr              160        0        0            0        0");
     EXPECT_EQ(messagesOf(checker), Messages());
 }
 
@@ -194,9 +201,49 @@ std::map<std::string, std::uint64_t> countsOf(const std::string& file)
     return counts;
 }
 
-TEST(Checker, CountsTheSituationsOfAllBlocks)
+TEST(Checker, CountsSituationsOnlyWhenAskedTo)
+{
+    const Checker checker = started();
+    const TemporaryFolder folder;
+    observeAll(checker, MORVIK_CHECKER_LLR);
+    EXPECT_FALSE(has(morvik_checker_report(checker.get()), "situations"));
+    EXPECT_STREQ(morvik_checker_situations(checker.get()), "");
+    EXPECT_EQ(morvik_checker_write_situations(checker.get(), folder.path("met.csv").c_str()), MORVIK_CHECKER_REFUSED);
+    const std::string refusal = "ERROR:checker:Situations are counted only if count_situations asks for it";
+    EXPECT_EQ(messagesOf(checker), (Messages{refusal, refusal}));
+}
+
+TEST(Checker, CountsTheSituationsOfTheBlockUnderWay)
+{
+    const Checker early = counting();
+    const Checker late = started();
+    observeAll(early, MORVIK_CHECKER_LLR);
+    observeAll(late, MORVIK_CHECKER_LLR);
+    for (int time = 0; time < 2; ++time) {
+        EXPECT_EQ(morvik_checker_count_situations(late.get()), MORVIK_CHECKER_AGREES);
+        EXPECT_STREQ(morvik_checker_situations(late.get()), morvik_checker_situations(early.get()));
+    }
+    const std::string report = morvik_checker_report(late.get());
+    EXPECT_TRUE(has(report, "\nsituations: 22 of 130 met, in 1 block")) << report;
+    EXPECT_EQ(messagesOf(late), Messages());
+}
+
+/// Blocks that ended before the call are not counted.
+TEST(Checker, CountsSituationsFromTheCallOn)
 {
     const Checker checker = started(1);
+    observeAll(checker, MORVIK_CHECKER_LLR);
+    ASSERT_EQ(start(checker, noisyBlock(2), 2), MORVIK_CHECKER_AGREES);
+    ASSERT_EQ(morvik_checker_count_situations(checker.get()), MORVIK_CHECKER_AGREES);
+    observeAll(checker, MORVIK_CHECKER_LLR);
+    const Checker other = counting(2);
+    observeAll(other, MORVIK_CHECKER_LLR);
+    EXPECT_STREQ(morvik_checker_situations(checker.get()), morvik_checker_situations(other.get()));
+}
+
+TEST(Checker, CountsTheSituationsOfAllBlocks)
+{
+    const Checker checker = counting(1);
     const std::string nothing = morvik_checker_situations(checker.get());
     EXPECT_EQ(nothing.rfind("num_pu,algorithm,situation,count\n2,scaled,blocks,0\n2,scaled,wrap.sum.above,0\n", 0), 0U);
     for (int signal = 0; signal < MORVIK_CHECKER_SIGNALS; ++signal) {
@@ -217,7 +264,7 @@ TEST(Checker, CountsTheSituationsOfAllBlocks)
 
 TEST(Checker, CountsSituationsAtRightValuesAlone)
 {
-    const Checker checker = started(1);
+    const Checker checker = counting(1);
     const auto decided = [&checker] {
         auto counts = countsOf(morvik_checker_situations(checker.get()));
         return counts["decision.zero"] + counts["decision.one"] + counts["decision.none"];
@@ -238,7 +285,7 @@ TEST(Checker, CountsSituationsAtRightValuesAlone)
 /// g3 is g0, and a test bench may observe either.
 TEST(Checker, CountsTheSituationsOfTwins)
 {
-    const Checker both[] = {started(1), started(1)};
+    const Checker both[] = {counting(1), counting(1)};
     observeAll(both[0], MORVIK_CHECKER_G);
     observeAll(both[1], MORVIK_CHECKER_G + 3);
     EXPECT_GT(countsOf(morvik_checker_situations(both[0].get()))["branch.g0.above"], 0U);
@@ -247,7 +294,7 @@ TEST(Checker, CountsTheSituationsOfTwins)
 
 TEST(Checker, WritesSituations)
 {
-    const Checker checker = started(1);
+    const Checker checker = counting(1);
     observeAll(checker, MORVIK_CHECKER_LLR);
     const TemporaryFolder folder;
     EXPECT_EQ(morvik_checker_write_situations(checker.get(), folder.path("met.csv").c_str()), MORVIK_CHECKER_AGREES);
@@ -259,6 +306,7 @@ TEST(Checker, WritesSituations)
     ASSERT_EQ(messages.size(), 2U);
     EXPECT_TRUE(has(messages[0], "no/met.csv")) << messages[0];
     EXPECT_EQ(messages[1], "ERROR:checker:The file name is a null pointer");
+    EXPECT_EQ(morvik_checker_count_situations(nullptr), MORVIK_CHECKER_REFUSED);
     EXPECT_EQ(morvik_checker_write_situations(nullptr, "met.csv"), MORVIK_CHECKER_REFUSED);
     EXPECT_STREQ(morvik_checker_situations(nullptr), "");
 }
@@ -387,9 +435,9 @@ TEST(Checker, TellsWhyAConfigurationIsRefused)
     ASSERT_TRUE(checker);
     EXPECT_EQ(morvik_checker_is_open(checker.get()), 0);
     EXPECT_EQ(start(checker, noisyBlock(1), 2), MORVIK_CHECKER_REFUSED);
-    EXPECT_EQ(messagesOf(checker),
-              (Messages{"ERROR:decoder:C_NUM_PU must be either 2, 4 or 8",
-                        "ERROR:checker:The configuration of this checker was refused, so it does not check"}));
+    EXPECT_EQ(morvik_checker_count_situations(checker.get()), MORVIK_CHECKER_REFUSED);
+    const std::string refusal = "ERROR:checker:The configuration of this checker was refused, so it does not check";
+    EXPECT_EQ(messagesOf(checker), (Messages{"ERROR:decoder:C_NUM_PU must be either 2, 4 or 8", refusal, refusal}));
 }
 
 TEST(Checker, PassesTheModelsWarningsOn)
