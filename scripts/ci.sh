@@ -115,9 +115,10 @@ stage_memory() {
 # Leaves out other long tests whose code shorter tests run as well: statistics over many blocks, self-tests, a dump for
 # each fault, and scripts that check numbers.
 stage_memory-short() {
-    local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance'
+    local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance|NamesNoMistakeThat'
     many+='|FindsTheSoftBuffer|FindsScales|FindsMistakesBy'
-    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore"
+    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|(Faults/FaultyCore|Stages/Mistakes)"
+    long+='|Coverage\.IsWholeInASet'
     local scripts='example_sweep|core_from_document|default_core'
     memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"
 }

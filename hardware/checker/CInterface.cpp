@@ -37,7 +37,8 @@ struct morvik_checker {
     morvik::SoftBlock block;
     std::size_t positions = 0;  ///< put, also beyond what a block holds
     std::deque<std::string> messages;
-    std::string text;  ///< last given to the caller
+    bool isExhausted = false;  ///< a call found no memory, which no message has told yet
+    std::string text;          ///< last given to the caller
 };
 
 namespace {
@@ -91,9 +92,14 @@ std::int32_t guarded(morvik_checker* checker, Function function)
             queue(*checker, "ERROR:checker:" + wrong.what);
         } catch (const morvik::Refusal& refusal) {
             queue(*checker, refusal.what());
+        } catch (const std::bad_alloc&) {
+            throw;
+        } catch (const std::exception& error) {
+            queue(*checker, std::string("ERROR:checker:Internal error: ") + error.what());
         }
         return MORVIK_CHECKER_REFUSED;
     } catch (const std::exception&) {
+        checker->isExhausted = true;
         return MORVIK_CHECKER_OUT_OF_MEMORY;
     }
 }
@@ -441,6 +447,10 @@ const char* morvik_checker_message(morvik_checker* checker)
         return "";
     }
     checker->text.clear();
+    if (checker->messages.empty() && checker->isExhausted) {
+        checker->isExhausted = false;
+        return "ERROR:checker:Out of memory";
+    }
     if (!checker->messages.empty()) {
         checker->text.swap(checker->messages.front());
         checker->messages.pop_front();

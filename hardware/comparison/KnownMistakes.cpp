@@ -20,8 +20,27 @@ struct NamedMistake {
     const char* text;
 };
 
-constexpr std::array<const char*, 13> countWords = {
-    "no", "one", "two", "three", "four", "five", "six", "seven", "eight", "nine", "ten", "eleven", "twelve"};
+/// How many of an aligned word's bits, all but the sign at most.
+constexpr std::array<const char*, 16> countWords = {"no",
+                                                    "one",
+                                                    "two",
+                                                    "three",
+                                                    "four",
+                                                    "five",
+                                                    "six",
+                                                    "seven",
+                                                    "eight",
+                                                    "nine",
+                                                    "ten",
+                                                    "eleven",
+                                                    "twelve",
+                                                    "thirteen",
+                                                    "fourteen",
+                                                    "fifteen"};
+static_assert(countWords.size() == rules::stateAlignment + rules::stateBits);
+
+/// The most low bits that a mask clears of those that are tried on any faults.
+constexpr unsigned mostZeros = 12;
 
 constexpr unsigned lowZeros(unsigned word)
 {
@@ -34,7 +53,7 @@ constexpr unsigned lowZeros(unsigned word)
 
 /// The low bits that rule 11 clears in border metrics. A dump shows those from an eighth on.
 constexpr unsigned borderZeros = lowZeros(static_cast<std::uint16_t>(rules::borderMask));
-static_assert(borderZeros > rules::stateAlignment && borderZeros < countWords.size());
+static_assert(borderZeros > rules::stateAlignment && borderZeros <= mostZeros);
 
 /// A word as "0xFF80".
 std::string hexadecimal(int word)
@@ -332,7 +351,7 @@ private:
 
     void addBorders()
     {
-        for (unsigned zeros = rules::stateAlignment; zeros < countWords.size(); ++zeros) {
+        for (unsigned zeros = rules::stateAlignment; zeros <= mostZeros; ++zeros) {
             if (zeros != borderZeros) {
                 itsMistakes.push_back(otherMask(-(1 << (zeros - rules::stateAlignment))));
             }

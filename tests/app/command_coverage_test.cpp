@@ -82,13 +82,14 @@ TEST_F(Coverage, OfNamedSituationsTakesFewBlocks)
         run("vectors",
             {"--out", "set", "--block-size", "40", "--blocks", "0", "--no-directed", "--cover", "input,tail.natural"});
     EXPECT_EQ(made.status, 0) << made.err;
-    for (const auto& each : jsonOf({"set"})["situations"]) {
+    const auto set = jsonOf({"set"});
+    for (const auto& each : set["situations"]) {
         const std::string name = each["name"];
         if (name.rfind("input.", 0) == 0 || name.rfind("tail.natural.", 0) == 0) {
             EXPECT_GT(each["count"], 0) << name;
         }
     }
-    EXPECT_LT(jsonOf({"set"})["cores"][0]["blocks"], 12);
+    EXPECT_LT(set["cores"][0]["blocks"], 12);
     const CommandResult none = run("vectors",
                                    {"--out",
                                     "none",

@@ -1,10 +1,12 @@
 // core: decodes a block and writes what hardware like this model would, as a dump: CSV with a row for each value of
 // each pass; hardware without a fault, or with one that has a name. Or as a replay, for test benches: see writeReplay.
+#include <algorithm>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <iostream>
 #include <string>
+#include <vector>
 
 #include "Fault.h"
 #include "hardware/comparison/Model.h"
@@ -18,17 +20,23 @@ using morvik::faults::Fault;
 /// What a core has that is made from now on; none when it is sound.
 const Fault* chosenFault = nullptr;
 
-const Fault* findFault(const std::string& name)
+std::vector<const Fault*> allFaults()
 {
+    std::vector<const Fault*> all;
     for (const auto* faults :
          {&morvik::faults::softValueFaults(), &morvik::faults::borderFaults(), &morvik::faults::kernelFaults()}) {
         for (const Fault& fault : *faults) {
-            if (fault.name == name) {
-                return &fault;
-            }
+            all.push_back(&fault);
         }
     }
-    return nullptr;
+    return all;
+}
+
+const Fault* findFault(const std::string& name)
+{
+    const std::vector<const Fault*> all = allFaults();
+    const auto found = std::find_if(all.begin(), all.end(), [&](const Fault* fault) { return fault->name == name; });
+    return found != all.end() ? *found : nullptr;
 }
 
 /// Puts the component with the fault in the place of the sound one.
@@ -126,9 +134,15 @@ veltra_ip_morvik_v1_0_state* __wrap_veltra_ip_morvik_v1_0_create_state(veltra_ip
 // NOLINTEND(bugprone-reserved-identifier)
 
 /// Arguments: the fault or "none", units, algorithm type, iterations, and perhaps "replay". The block comes from
-/// standard input.
+/// standard input. "list" alone prints the names of all faults.
 int main(int argc, char** argv)
 {
+    if (argc == 2 && std::string(argv[1]) == "list") {
+        for (const Fault* fault : allFaults()) {
+            std::cout << fault->name << '\n';
+        }
+        return 0;
+    }
     const bool isReplay = argc == 6 && std::string(argv[5]) == "replay";
     if (argc != 5 && !isReplay) {
         return 2;

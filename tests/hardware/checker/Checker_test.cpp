@@ -1,9 +1,12 @@
 // The checker by its C interface: answers, messages, and what it refuses.
 #include <gtest/gtest.h>
+#include <sys/resource.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <array>
 #include <cstdlib>
+#include <fstream>
 #include <map>
 #include <sstream>
 
@@ -467,6 +470,52 @@ TEST(Checker, TakesNullForOneThatIsNotOpen)
     EXPECT_STREQ(morvik_checker_report(nullptr), "");
     EXPECT_STREQ(morvik_checker_message(nullptr), "");
 }
+
+// A sanitizer's allocator ends the process instead; the builds with sanitizers are clang's.
+#if !defined(__clang__)
+/// Leaves the process a little memory during its lifetime.
+class LittleMemory {
+public:
+    LittleMemory()
+    {
+        getrlimit(RLIMIT_AS, &itsLimit);
+        std::ifstream file("/proc/self/statm");
+        rlim_t pages = 0;
+        file >> pages;
+        constexpr rlim_t spare = 1U << 20U;
+        const rlimit little = {pages * static_cast<rlim_t>(sysconf(_SC_PAGESIZE)) + spare, itsLimit.rlim_max};
+        setrlimit(RLIMIT_AS, &little);
+    }
+
+    ~LittleMemory()
+    {
+        setrlimit(RLIMIT_AS, &itsLimit);
+    }
+
+    LittleMemory(const LittleMemory&) = delete;
+    LittleMemory& operator=(const LittleMemory&) = delete;
+
+private:
+    rlimit itsLimit{};
+};
+
+TEST(Checker, TellsThatThereIsNoMemory)
+{
+    const Checker checker = makeChecker(2, 1);
+    morvik::blocks::Random random(1);
+    const auto block = morvik::blocks::randomBlock(random, 6144, morvik::blocks::Values::uniform);
+    int answer = 0;
+    {
+        const LittleMemory little;
+        answer = start(checker, block, 15);
+    }
+    EXPECT_EQ(answer, MORVIK_CHECKER_OUT_OF_MEMORY);
+    EXPECT_STREQ(morvik_checker_message(checker.get()), "ERROR:checker:Out of memory");
+    EXPECT_STREQ(morvik_checker_message(checker.get()), "");
+    EXPECT_NE(morvik_checker_standing(checker.get()), MORVIK_CHECKER_AGREES);
+    EXPECT_EQ(start(checker, block, 1), MORVIK_CHECKER_AGREES) << "with memory again";
+}
+#endif
 
 TEST(Checker, KeepsABoundedNumberOfMessages)
 {

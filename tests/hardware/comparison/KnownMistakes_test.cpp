@@ -199,4 +199,17 @@ TEST(FittedMistakes, TellTheRangeOfAnAddress)
     expectFound(AddressError::window, " within a window");
 }
 
+TEST(FittedMistakes, TellEveryMaskOfBorders)
+{
+    for (int mask = -2048; mask < 2048; ++mask) {
+        if (mask != 0) {
+            const std::string text = otherMask(mask).text;
+            EXPECT_TRUE(text.find("low bits of border metrics are") != std::string::npos ||
+                        text.find("border metrics are ANDed with 0x") == 0)
+                << mask << ": " << text;
+        }
+    }
+    EXPECT_EQ(otherMask(-2048).text, "fifteen low bits of border metrics are cleared, not seven (rule 11)");
+}
+
 }  // namespace
