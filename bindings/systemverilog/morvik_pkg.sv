@@ -218,6 +218,21 @@ package morvik_pkg;
         endfunction
     endclass
 
+    // What observe and observe_row of a checker do, on its raw(). Calls through a class cost a simulator more than what they
+    // call; here, told(answer) of the checker passes the messages on where the answer is not CHECKER_AGREES.
+    function automatic int raw_observe(chandle raw, int signal, int half_iteration, int step, logic signed [31:0] got);
+        return morvik_checker_observe(raw, signal, half_iteration, step, $isunknown(got) ? VALUE_UNKNOWN : got);
+    endfunction
+
+    function automatic int raw_observe_row(chandle raw, int signal, int half_iteration, int step, metrics_t got);
+        if ($isunknown(got[0] ^ got[1] ^ got[2] ^ got[3] ^ got[4] ^ got[5] ^ got[6] ^ got[7]))  // x stays x
+            for (int i = 0; i < 8; i++)
+                if ($isunknown(got[i]))
+                    got[i] = VALUE_UNKNOWN;
+        return morvik_dpi_observe_row(raw, signal, half_iteration, step,
+            got[0], got[1], got[2], got[3], got[4], got[5], got[6], got[7]);
+    endfunction
+
     // A checker: compares the values of a core with the model while the simulation runs. docs/checker.md explains it. Call
     // destroy when done with it.
     class morvik_checker extends morvik_speaker;
@@ -258,7 +273,7 @@ package morvik_pkg;
         // error. Returns CHECKER_AGREES, CHECKER_DIFFERS or CHECKER_REFUSED.
         function int observe(int signal, int half_iteration, int step, logic signed [31:0] got);
             int answer;
-            answer = morvik_checker_observe(handle, signal, half_iteration, step, $isunknown(got) ? VALUE_UNKNOWN : got);
+            answer = raw_observe(handle, signal, half_iteration, step, got);
             if (answer != CHECKER_AGREES)
                 void'(answered(answer));
             return answer;
@@ -267,15 +282,20 @@ package morvik_pkg;
         // The same for all values of SIGNAL_G, SIGNAL_ALPHA or SIGNAL_BETA.
         function int observe_row(int signal, int half_iteration, int step, metrics_t got);
             int answer;
-            if ($isunknown(got[0] ^ got[1] ^ got[2] ^ got[3] ^ got[4] ^ got[5] ^ got[6] ^ got[7]))  // x stays x
-                for (int i = 0; i < 8; i++)
-                    if ($isunknown(got[i]))
-                        got[i] = VALUE_UNKNOWN;
-            answer = morvik_dpi_observe_row(handle, signal, half_iteration, step,
-                got[0], got[1], got[2], got[3], got[4], got[5], got[6], got[7]);
+            answer = raw_observe_row(handle, signal, half_iteration, step, got);
             if (answer != CHECKER_AGREES)
                 void'(answered(answer));
             return answer;
+        endfunction
+
+        // For raw_observe and raw_observe_row, until destroy.
+        function chandle raw();
+            return handle;
+        endfunction
+
+        // Passes the messages on after an answer of raw_observe or raw_observe_row, and returns it.
+        function int told(int answer);
+            return answered(answer);
         endfunction
 
         // What the core computes, or VALUE_UNKNOWN where it computes nothing.

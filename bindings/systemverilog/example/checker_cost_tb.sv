@@ -66,6 +66,7 @@ module checker_cost_tb;
     logic signed [11:0] llr;
     int unsigned random = 1;
     morvik_checker check;
+    chandle raw;
     int values[steps][23];  // right ones: a core that is checked for long has no others
 
     datapath dut (.*);
@@ -87,22 +88,27 @@ module checker_cost_tb;
 
     function automatic void observe(int step);
         metrics_t row;
-        void'(check.observe(SIGNAL_INTRINSIC, 0, step, values[step][SIGNAL_INTRINSIC]));
+        int differs;
+        differs = 0;
+        differs |= raw_observe(raw, SIGNAL_INTRINSIC, 0, step, values[step][SIGNAL_INTRINSIC]);
         for (int i = 0; i < 4; i++)
             row[i] = values[step][SIGNAL_G + i];
-        void'(check.observe_row(SIGNAL_G, 0, step, row));
+        differs |= raw_observe_row(raw, SIGNAL_G, 0, step, row);
         for (int i = 0; i < 8; i++)
             row[i] = values[step][SIGNAL_ALPHA + i];
-        void'(check.observe_row(SIGNAL_ALPHA, 0, step, row));
+        differs |= raw_observe_row(raw, SIGNAL_ALPHA, 0, step, row);
         for (int i = 0; i < 8; i++)
             row[i] = values[step][SIGNAL_BETA + i];
-        void'(check.observe_row(SIGNAL_BETA, 0, step, row));
-        void'(check.observe(SIGNAL_LLR, 0, step, values[step][SIGNAL_LLR]));
-        void'(check.observe(SIGNAL_EXTRINSIC, 0, step, values[step][SIGNAL_EXTRINSIC]));
+        differs |= raw_observe_row(raw, SIGNAL_BETA, 0, step, row);
+        differs |= raw_observe(raw, SIGNAL_LLR, 0, step, values[step][SIGNAL_LLR]);
+        differs |= raw_observe(raw, SIGNAL_EXTRINSIC, 0, step, values[step][SIGNAL_EXTRINSIC]);
+        if (differs != 0)
+            void'(check.told(differs));
     endfunction
 
     initial begin
         check = new(8, ALGORITHM_SCALED);
+        raw = check.raw();
         if (CHECK == 2)
             check.count_situations();
         for (int n = 0; n < clocks; n++) begin

@@ -130,7 +130,11 @@ module wrong_use_tb;
         expect_answer(check, check.observe_row(SIGNAL_BETA + 1, 3, 5, row), CHECKER_REFUSED,
             "ERROR:checker:beta1 is not the first of its row, beta0");
         expect_answer(check, check.observe_row(SIGNAL_BETA, 3, 5, row), CHECKER_AGREES, "agrees");
-        expect_answer(check, check.standing(), CHECKER_INCOMPLETE, "agrees");
+        expect_answer(check, check.told(raw_observe_row(check.raw(), SIGNAL_BETA, 3, 5, row)), CHECKER_AGREES, "");
+        expect_answer(check, check.told(raw_observe(check.raw(), SIGNAL_LLR, 16, 0, 0)), CHECKER_REFUSED,
+            "ERROR:checker:Half-iteration 16 is not allowed, expected 0 to 15");
+        expect_answer(check, check.standing(), CHECKER_INCOMPLETE,
+            "ERROR:checker:Half-iteration 16 is not allowed, expected 0 to 15");
         expect_answer(check, check.report(1), CHECKER_AGREES, "");
         expect_answer(check, check.report(), CHECKER_INCOMPLETE, "ERROR:checker:Values are missing");
         expect_answer(check, check.write_situations("/nowhere/met.csv"), CHECKER_REFUSED,
