@@ -117,7 +117,7 @@ stage_memory() {
 stage_memory-short() {
     local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance|NamesNoMistakeThat'
     many+='|FindsTheSoftBuffer|FindsScales|FindsMistakesBy'
-    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|(Faults/FaultyCore|Stages/Mistakes)"
+    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore|Stages/Mistakes"
     long+='|Coverage\.IsWholeInASet'
     local scripts='example_sweep|core_from_document|default_core'
     memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"

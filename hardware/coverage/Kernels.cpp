@@ -1,24 +1,20 @@
 // Kernels: which situations the recursions and ratios of a pass meet.
 #include "Kernels.h"
 
-#include <memory>
 #include <optional>
-#include <vector>
 
 #include "PassWalk.h"
 #include "WatchedDecision.h"
 #include "hardware/comparison/Decisions.h"
+#include "hardware/testbench/Corrections.h"
 #include "rules/Correction.h"
 #include "rules/Schedule.h"
-#include "src/TCalculationEngineModBase.h"
-#include "src/TNumberFormat.h"
 
 namespace morvik::coverage {
 
 namespace {
 
 /// The table of 16 points has an entry for each half of a real unit (rule 9).
-constexpr unsigned tablePoints = 16;
 constexpr unsigned log2Points = 4;
 constexpr unsigned entryBits =
     rules::fractionBits + rules::stateAlignment - rules::resolvedFractionBits(rules::fractionBits, log2Points);
@@ -31,15 +27,6 @@ enum Kernel : unsigned { forwardKernel = 0, backwardKernel = 1, ratioKernel = 2 
 constexpr unsigned nodesOfTree = 7;
 
 using Table = comparison::Corrections<Word>;
-
-Table corrections()
-{
-    static const std::vector<unsigned char> table = [] {
-        const std::unique_ptr<TNumberFormat> format(TNumberFormat::create("Fix_12_3"));
-        return TCalculationEngineModBase::createLUT(tablePoints, *format);
-    }();
-    return {table.data() + table.size() / 2};
-}
 
 /// Walks through the decisions of a pass.
 template <class Rule>
@@ -265,7 +252,7 @@ void findInKernels(const comparison::Model& model, unsigned pass, Taker& taker)
 {
     if (model.generics.C_ALGORITHM_TYPE == 2) {
         using Rule = rules::DecideMaxHash<Word, Table>;
-        KernelWalk<Rule>(model, pass, taker, Rule(corrections())).run();
+        KernelWalk<Rule>(model, pass, taker, Rule(Table{corrections()})).run();
     } else {
         using Rule = rules::DecideMax<Word>;
         KernelWalk<Rule>(model, pass, taker, Rule()).run();

@@ -18,7 +18,20 @@ constexpr unsigned decisionsOfBit = states - 1;  // of the ratio's tree
 constexpr unsigned pairsOfBit = states / 2;      // the first of them, on which nothing is pending yet
 
 /// The corrections of the table in eighths, the greatest first (rule 9).
-constexpr std::array<int, 6> entries = {6, 4, 3, 2, 1, 0};
+const std::vector<int>& entries()
+{
+    static const std::vector<int> all = [] {
+        std::vector<int> found;
+        for (int difference = 0; found.empty() || found.back() != 0; ++difference) {
+            const int entry = eighthsOf(corrections()[difference]);
+            if (found.empty() || found.back() != entry) {
+                found.push_back(entry);
+            }
+        }
+        return found;
+    }();
+    return all;
+}
 
 std::vector<Situation> ofDecisions(const char* place, unsigned places, bool isRatio, int algorithm)
 {
@@ -28,7 +41,7 @@ std::vector<Situation> ofDecisions(const char* place, unsigned places, bool isRa
                                   {"tie", place, counts},
                                   {"comparison wraps", place, counts}};
     if (algorithm == tableAlgorithm) {
-        for (const int entry : entries) {
+        for (const int entry : entries()) {
             all.push_back({"correction " + std::to_string(entry) + ", first candidate", place, counts});
             all.push_back({"correction " + std::to_string(entry) + ", second candidate", place, counts});
         }
@@ -117,7 +130,7 @@ void countDecisions(const Watch& watch, bool isRatio, int algorithm, std::vector
         counter.next(met.difference > 0).next(met.difference < 0).next(met.difference == 0).next(met.wraps);
         if (algorithm == tableAlgorithm) {
             const int correction = eighthsOf(corrections()[met.difference]);
-            for (const int entry : entries) {
+            for (const int entry : entries()) {
                 counter.next(entry == correction && met.difference >= 0);
                 counter.next(entry == correction && met.difference < 0);
             }
