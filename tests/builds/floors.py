@@ -28,7 +28,7 @@ BELOW = {
     "hardware/vectors": "base hardware/comparison hardware/coverage hardware/tables hardware/testbench link link/channel link/coding link/random rules simulation",
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
-    "hardware/coverage": "base hardware/comparison hardware/testbench rules src",
+    "hardware/coverage": "base hardware/comparison hardware/testbench rules",
     "hardware/units": "hardware/tables hardware/testbench rules",
     "hardware/checker": "base hardware/comparison hardware/coverage hardware/testbench rules",
     "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
