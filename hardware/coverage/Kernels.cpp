@@ -4,9 +4,8 @@
 #include <optional>
 
 #include "PassWalk.h"
-#include "WatchedDecision.h"
-#include "hardware/comparison/Decisions.h"
 #include "hardware/testbench/Corrections.h"
+#include "hardware/testbench/WatchedDecision.h"
 #include "rules/Correction.h"
 #include "rules/Schedule.h"
 
@@ -25,8 +24,6 @@ enum Kernel : unsigned { forwardKernel = 0, backwardKernel = 1, ratioKernel = 2 
 
 /// Decisions of one bit in a ratio's tree.
 constexpr unsigned nodesOfTree = 7;
-
-using Table = comparison::Corrections<Word>;
 
 /// Walks through the decisions of a pass.
 template <class Rule>
@@ -238,7 +235,7 @@ private:
         }
         const unsigned sign = difference < 0 ? lower : upper;
         take(situation(Family::correction, kernel, 2 * static_cast<unsigned>(entry) + sign), place);
-        if (difference < 0 && -difference >> entryBits != entry) {
+        if (difference < 0 && corrections()[difference] != corrections()[-difference]) {
             take(situation(Family::inverted, kernel), place);
         }
     }
@@ -251,8 +248,8 @@ private:
 void findInKernels(const comparison::Model& model, unsigned pass, Taker& taker)
 {
     if (model.generics.C_ALGORITHM_TYPE == 2) {
-        using Rule = rules::DecideMaxHash<Word, Table>;
-        KernelWalk<Rule>(model, pass, taker, Rule(Table{corrections()})).run();
+        using Rule = rules::DecideMaxHash<Word, CorrectionTable>;
+        KernelWalk<Rule>(model, pass, taker, Rule(CorrectionTable())).run();
     } else {
         using Rule = rules::DecideMax<Word>;
         KernelWalk<Rule>(model, pass, taker, Rule()).run();

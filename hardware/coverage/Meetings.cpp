@@ -101,9 +101,11 @@ private:
         const double scale = rules::extrinsicScale(itsModel.generics.C_ALGORITHM_TYPE);
         const std::int32_t exact = at(placeOf(Stage::ratio, step)) - 2 * twiceIntrinsic(step);
         const auto scaled = static_cast<std::int32_t>(exact * scale);
-        const bool isClipped = rules::clip(scaled, rules::branchSmallest, rules::branchLargest) != scaled;
+        // Rounded first, as between the largest value and the next eighth the clip changes nothing.
+        const std::int32_t rounded = scaled & rules::extrinsicMask(scale, eighthMask);
+        const bool isClipped = rules::clip(rounded, rules::branchSmallest, rules::branchLargest) != rounded;
         takeBeyond(isClipped ? Family::extrinsicClip : Family::scaledInside, 0, exact, place);
-        if (!isClipped && (scaled & ~rules::extrinsicMask(scale, eighthMask)) != 0) {
+        if (!isClipped && rounded != scaled) {
             takeSign(Family::scaledRounded, scaled, place);
         }
     }

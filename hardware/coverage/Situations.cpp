@@ -148,7 +148,7 @@ std::vector<Description> ofArithmetic()
          9,
          N::table,
          "table.%.inverted",
-         "In the %, a negative difference has another entry than the positive one, as its magnitude is one less",
+         "In the %, a negative difference has another correction than the positive one, as its magnitude is one less",
          kernels},
         {F::border,
          11,

@@ -33,7 +33,7 @@ enum class Family : std::uint8_t {
     pendingTie,        ///< equal candidates with different pending corrections
     correction,        ///< an entry of the table
     noCorrection,      ///< a difference beyond the table
-    inverted,          ///< a negative difference that inversion takes into the entry before
+    inverted,          ///< a negative difference that inversion takes to another correction
     border,            ///< stored metrics that lose bits
     tailSum,           ///< branch sums wider than branch metrics
     tailState,         ///< from which the tail leads back

@@ -2,11 +2,15 @@
 #include "Situations.h"
 
 #include <algorithm>
+#include <array>
+#include <cmath>
 #include <numeric>
+#include <optional>
+#include <type_traits>
 #include <utility>
 
+#include "Steps.h"
 #include "Units.h"
-#include "Watching.h"
 #include "rules/Algorithms.h"
 
 namespace morvik::units {
@@ -46,7 +50,10 @@ std::vector<Situation> ofDecisions(const char* place, unsigned places, bool isRa
             all.push_back({"correction " + std::to_string(entry) + ", second candidate", place, counts});
         }
         const unsigned withoutPending = isRatio ? 2 * pairsOfBit : 0;
-        all.push_back({"pending correction added", place, std::vector<std::uint64_t>(places - withoutPending)});
+        for (const char* const name :
+             {"pending correction added", "tie of different corrections", "corrections would turn it"}) {
+            all.push_back({name, place, std::vector<std::uint64_t>(places - withoutPending)});
+        }
     }
     all.push_back({"a sum wraps", "", {0}});
     if (isRatio) {
@@ -121,25 +128,41 @@ private:
     unsigned itsPlace;
 };
 
-void countDecisions(const Watch& watch, bool isRatio, int algorithm, std::vector<Situation>& all)
-{
-    unsigned withPending = 0;
-    for (unsigned place = 0; place < watch.decisions.size(); ++place) {
-        const Decision& met = watch.decisions[place];
-        Counter counter(all, place);
-        counter.next(met.difference > 0).next(met.difference < 0).next(met.difference == 0).next(met.wraps);
-        if (algorithm == tableAlgorithm) {
-            const int correction = eighthsOf(corrections()[met.difference]);
-            for (const int entry : entries()) {
-                counter.next(entry == correction && met.difference >= 0);
-                counter.next(entry == correction && met.difference < 0);
-            }
-            if (!isRatio || place % decisionsOfBit >= pairsOfBit) {
-                counter.at(withPending++).next(met.addsPending);
-            }
-        }
+/// A decision between two candidates.
+struct Decision {
+    rules::Value difference = 0;  ///< of the candidates, as it wraps
+    bool wraps = false;
+    bool addsPending = false;       ///< a correction other than 0
+    bool isTieOfDifferent = false;  ///< of candidates with different corrections pending
+    bool wouldTurn = false;         ///< if the candidates were compared with what is pending with them
+};
+
+/// The decisions of a step, or those of a ratio's tree, by their numbers.
+struct Watched {
+    std::array<Decision, states> decisions = {};
+    bool sumWraps = false;
+
+    template <class Metric>
+    void operator()(unsigned number, const Metric& c1, const Metric& c2)
+    {
+        const auto difference = rules::wrap16(c1.value() - c2.value());
+        const Metric& winner = difference < 0 ? c2 : c1;
+        const bool differ = c1.pending() != c2.pending();
+        const auto withPending = rules::wrap16(difference + c1.pending() - c2.pending());
+        decisions[number] = {difference,
+                             difference != c1.value() - c2.value(),
+                             winner.pending() != 0,
+                             difference == 0 && differ,
+                             (difference < 0) != (withPending < 0)};
+        sumWraps = sumWraps || c1.wrap != Wrap::none || c2.wrap != Wrap::none;
+        addSum(winner.value() + winner.pending());
     }
-}
+
+    void addSum(std::int32_t exact)
+    {
+        sumWraps = sumWraps || rules::wrap16(exact) != exact;
+    }
+};
 
 template <class Row>
 auto rowAt(const std::vector<std::int32_t>& inputs, std::size_t first)
@@ -149,37 +172,104 @@ auto rowAt(const std::vector<std::int32_t>& inputs, std::size_t first)
     return row;
 }
 
+/// Counts a decision in its place, among those on which a correction may be pending in another one, if it is one.
+void countDecision(const Decision& met,
+                   unsigned place,
+                   std::optional<unsigned> placeWithPending,
+                   int algorithm,
+                   std::vector<Situation>& all)
+{
+    Counter counter(all, place);
+    counter.next(met.difference > 0).next(met.difference < 0).next(met.difference == 0).next(met.wraps);
+    if (algorithm != tableAlgorithm) {
+        return;
+    }
+    const int correction = eighthsOf(corrections()[met.difference]);
+    for (const int entry : entries()) {
+        counter.next(entry == correction && met.difference >= 0);
+        counter.next(entry == correction && met.difference < 0);
+    }
+    if (placeWithPending) {
+        counter.at(*placeWithPending).next(met.addsPending).next(met.isTieOfDifferent).next(met.wouldTurn);
+    }
+}
+
+/// Hands decisions over to what watches them.
+struct See {
+    Watched* watched;
+
+    template <class Metric>
+    void operator()(unsigned number, const Metric& c1, const Metric& c2) const
+    {
+        (*watched)(number, c1, c2);
+    }
+};
+
+template <class Rule>
+using Watch = WatchedDecision<Rule, See, true>;
+
 void countStep(bool isForward, int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
 {
-    Watch watch;
+    Watched watched;
     const Column from = {rowAt<Metrics>(inputs, 0), rowAt<Metrics>(inputs, states)};
     const auto g = wordsOf(rowAt<Branches>(inputs, std::size_t{2} * states));
-    advanced(algorithm, from, [&](const auto& rule, const auto& column) {
-        const Watching watching(rule, watch);
-        return isForward ? rules::forwardStep(watching, column, g) : rules::backwardStep(watching, column, g);
+    advanced(algorithm, from, [&](const auto& rule, auto column) {
+        Watch<std::decay_t<decltype(rule)>> watch(rule, false, See{&watched});
+        rules::Column<decltype(watch)> metrics{};
+        for (unsigned state = 0; state < states; ++state) {
+            metrics[state].itself = column[state];
+        }
+        watch.restart();
+        metrics = isForward ? rules::forwardStep(watch, metrics, g) : rules::backwardStep(watch, metrics, g);
+        return column;
     });
-    countDecisions(watch, false, algorithm, all);
-    all.back().counts[0] += watch.sumWraps ? 1U : 0U;
+    for (unsigned state = 0; state < states; ++state) {
+        countDecision(watched.decisions[state], state, state, algorithm, all);
+    }
+    all.back().counts[0] += watched.sumWraps ? 1U : 0U;
+}
+
+/// Where the tree's decisions of a bit are counted, by their numbers: pairs of states, then pairs of these, then the
+/// last one.
+constexpr unsigned placeOfNode(unsigned node)
+{
+    return node >= pairsOfBit ? node - pairsOfBit : node > 1 ? node + 2 : decisionsOfBit - 1;
+}
+
+/// Counts the decisions that lead to the best path of a bit: no other one can be seen in the ratio.
+void countPath(const Watched& watched, unsigned bitsBefore, int algorithm, std::vector<Situation>& all)
+{
+    for (unsigned node = 1; node < states; node = 2 * node + (watched.decisions[node].difference < 0 ? 1 : 0)) {
+        const unsigned place = placeOfNode(node);
+        const auto withPending = place < pairsOfBit
+                                     ? std::nullopt
+                                     : std::optional(bitsBefore * (decisionsOfBit - pairsOfBit) + place - pairsOfBit);
+        countDecision(watched.decisions[node], bitsBefore * decisionsOfBit + place, withPending, algorithm, all);
+    }
 }
 
 void countRatio(int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
 {
-    Watch watch;
+    std::array<Watched, 2> ofBits;  // bit 1 first
     const auto alpha = wordsOf(rowAt<Metrics>(inputs, 0));
     const auto beta = wordsOf(rowAt<Metrics>(inputs, states));
     const auto g = wordsOf(rowAt<Branches>(inputs, std::size_t{2} * states));
     const std::int32_t difference = withRule(algorithm, [&](const auto& rule) {
-        const Watching watching(rule, watch);
-        const std::int32_t one = rules::bestPath<1>(watching, alpha, beta, g);
-        return one - rules::bestPath<0>(watching, alpha, beta, g);
+        using Rule = std::decay_t<decltype(rule)>;
+        Watch<Rule> one(rule, true, See{&ofBits[0]});
+        Watch<Rule> zero(rule, true, See{&ofBits[1]});
+        one.restart();
+        zero.restart();
+        return rules::bestPath<1>(one, alpha, beta, g) - rules::bestPath<0>(zero, alpha, beta, g);
     });
     for (unsigned state = 0; state < states; ++state) {
         for (const unsigned bit : {0U, 1U}) {
-            watch.addSum(std::int32_t{alpha[state]} + beta[rules::successor(state, bit)]);
+            ofBits[0].addSum(std::int32_t{alpha[state]} + beta[rules::successor(state, bit)]);
         }
     }
-    countDecisions(watch, true, algorithm, all);
-    all[all.size() - 2].counts[0] += watch.sumWraps ? 1U : 0U;
+    countPath(ofBits[0], 0, algorithm, all);
+    countPath(ofBits[1], 1, algorithm, all);
+    all[all.size() - 2].counts[0] += ofBits[0].sumWraps || ofBits[1].sumWraps ? 1U : 0U;
     all.back().counts[0] += rules::wrap16(difference) != difference ? 1U : 0U;
 }
 
@@ -201,11 +291,12 @@ void countExtrinsic(int algorithm, const std::vector<std::int32_t>& inputs, std:
 {
     const auto& range = rangeOf(Kind::apriori);
     const double scaled = (inputs[0] - 2 * inputs[1]) * rules::extrinsicScale(algorithm);
-    const bool isClipped = scaled > range.highest || scaled < range.lowest;
+    const double rounded = std::floor(scaled);
+    const bool isClipped = rounded > range.highest || rounded < range.lowest;
     Counter counter(all, 0);
-    counter.next(scaled > range.highest).next(scaled < range.lowest);
+    counter.next(rounded > range.highest).next(rounded < range.lowest);
     if (rules::extrinsicScale(algorithm) != 1) {
-        const bool isRounded = !isClipped && scaled != extrinsic(algorithm, inputs[0], inputs[1]);
+        const bool isRounded = !isClipped && scaled != rounded;
         counter.next(isRounded && scaled > 0).next(isRounded && scaled < 0);
     }
 }

@@ -8,6 +8,7 @@
 
 #include "Units.h"
 #include "hardware/testbench/Corrections.h"
+#include "hardware/testbench/WatchedDecision.h"
 #include "rules/Formats.h"
 #include "rules/TrellisDecision.h"
 
@@ -25,32 +26,17 @@ constexpr std::int32_t eighthsOf(rules::Value word)
     return rules::integerOf(word, rules::stateAlignment);
 }
 
-/// The corrections of the table, by the difference of two candidates (rule 9).
-struct Table {
-    const unsigned char* middle;
-
-    rules::Value operator()(rules::Value difference) const
-    {
-        return middle[difference];
-    }
-};
-
 /// Calls use(rule) with the decision rule of an algorithm type.
 template <class Use>
 auto withRule(int algorithm, Use use)
 {
-    return algorithm == tableAlgorithm ? use(rules::DecideMaxHash<rules::Value, Table>(Table{corrections()}))
+    return algorithm == tableAlgorithm ? use(rules::DecideMaxHash<rules::Value, CorrectionTable>(CorrectionTable()))
                                        : use(rules::DecideMax<rules::Value>());
 }
 
 constexpr rules::Value valueOf(rules::Value metric)
 {
     return metric;
-}
-
-constexpr rules::Value pendingOf(rules::Value /*metric*/)
-{
-    return 0;
 }
 
 constexpr void take(rules::Value& metric, rules::Value value, rules::Value /*pending*/)
@@ -63,11 +49,6 @@ using PendingMetric = rules::PendingMetric<rules::Value>;
 constexpr rules::Value valueOf(const PendingMetric& metric)
 {
     return metric.value;
-}
-
-constexpr rules::Value pendingOf(const PendingMetric& metric)
-{
-    return metric.pending;
 }
 
 constexpr void take(PendingMetric& metric, rules::Value value, rules::Value pending)

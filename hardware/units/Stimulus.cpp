@@ -155,17 +155,32 @@ public:
     ChosenTree(unsigned bit, Random& random) : itsBit(bit), itsRandom(random) {}
 
     /// The decision of a node has the difference: 0 to 3 of the pairs, 4 and 5 between two pairs, 6 between the halves.
-    /// The first pair's best path has the metric `best`; all other decisions leave no correction.
-    std::vector<std::int32_t> inputs(unsigned node, std::int32_t difference, std::int32_t best)
+    /// Its first candidate has the metric `best`. What it decides is the bit's best path; where it does not decide
+    /// between two states, its candidates come from decisions with the differences `before`, which leave corrections.
+    /// All other decisions leave none.
+    std::vector<std::int32_t> inputs(unsigned node,
+                                     std::int32_t difference,
+                                     std::int32_t best,
+                                     const std::array<std::int32_t, 2>& before)
     {
-        std::array<std::int32_t, 4> paths = {best, best - apart(), best - apart(), best - apart()};
-        if (node == 4) {
-            paths[1] = paths[0] - difference;
-        } else if (node == 5) {
-            paths[3] = paths[2] - difference;
-        } else if (node == 6) {
-            paths[2] = paths[0] - difference;
-            paths[3] = paths[2] - apart();
+        const std::int32_t winner = difference < 0 ? best - difference : best;
+        std::array<std::int32_t, 4> paths{};
+        std::array<std::int32_t, 4> within{};  // the differences of the pairs
+        for (unsigned pair = 0; pair < paths.size(); ++pair) {
+            paths[pair] = winner - apart();
+            within[pair] = apart();
+        }
+        if (node < 4) {
+            paths[node] = best;
+            within[node] = difference;
+        } else if (node < 6) {
+            const unsigned first = node == 4 ? 0 : 2;
+            paths[first] = best;
+            paths[first + 1] = best - difference;
+            within[first] = before[0];
+            within[first + 1] = before[1];
+        } else {
+            paths = {best, best - before[0], best - difference, best - difference - before[1]};
         }
         const Metrics beta = itsRandom.metrics();
         const Branches g = itsRandom.branches();
@@ -173,34 +188,52 @@ public:
         for (unsigned pair = 0; pair < paths.size(); ++pair) {
             const unsigned even = 2 * pair;
             const unsigned odd = even + 1;
-            const std::int32_t before = paths[pair] - (itsBit == 1 ? g[pair] : -g[pair]);
-            const std::int32_t second = before - (node == pair ? difference : apart());
-            alpha[odd] = wrapped(before - beta[rules::successor(odd, itsBit)]);
+            const std::int32_t first = paths[pair] - (itsBit == 1 ? g[pair] : -g[pair]);
+            const std::int32_t second = first - within[pair];
+            alpha[odd] = wrapped(first - beta[rules::successor(odd, itsBit)]);
             alpha[even] = wrapped(second - beta[rules::successor(even, itsBit)]);
         }
         return Case().row(alpha).row(beta).row(g).inputs();
     }
 
-private:
     /// A difference beyond the correction table.
     std::int32_t apart()
     {
         return itsRandom.between(30, 300);
     }
 
+private:
     unsigned itsBit;
     Random& itsRandom;
 };
 
+constexpr unsigned nodesOfTree = states - 1;
+
 void directRatio(Random& random, const Take& take)
 {
-    constexpr unsigned nodes = states - 1;
     for (unsigned bit = 0; bit < 2; ++bit) {
         ChosenTree tree(bit, random);
-        for (unsigned node = 0; node < nodes; ++node) {
+        for (unsigned node = 0; node < nodesOfTree; ++node) {
             for (const std::int32_t difference : decisiveDifferences()) {
                 for (const std::int32_t best : {0, metric.highest, metric.lowest}) {
-                    take(tree.inputs(node, difference, best));
+                    take(tree.inputs(node, difference, best, {tree.apart(), tree.apart()}));
+                }
+            }
+        }
+    }
+}
+
+/// Decisions between candidates with corrections pending: about as far apart as the corrections are, or equal.
+void directPending(Random& random, const Take& take)
+{
+    for (unsigned bit = 0; bit < 2; ++bit) {
+        ChosenTree tree(bit, random);
+        for (unsigned node = 4; node < nodesOfTree; ++node) {
+            for (std::int32_t difference = -7; difference <= 7; ++difference) {
+                for (const std::int32_t first : {0, 8, 30}) {  // corrections of 6, 3 and 0
+                    for (const std::int32_t second : {0, 8, 30}) {
+                        take(tree.inputs(node, difference, random.of(metric), {first, second}));
+                    }
                 }
             }
         }
@@ -304,6 +337,9 @@ bool direct(Number unit, const StimulusSettings& settings, Random& random, const
         return false;
     case Number::ratio:
         directRatio(random, take);
+        if (settings.algorithm == tableAlgorithm) {
+            directPending(random, take);
+        }
         return false;
     case Number::extrinsic:
         directExtrinsic(take);

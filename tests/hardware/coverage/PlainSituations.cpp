@@ -164,7 +164,7 @@ private:
         }
         const int x = ratio - 2 * twice;
         const int scaled = itsAlgorithm == 1 ? 3 * x / 4 : x;
-        const bool isClipped = scaled > 2032 || scaled < -2048;
+        const bool isClipped = scaled >= 2048 || scaled < -2048;
         if (isClipped) {
             met(x > 0 ? "extrinsic.above" : "extrinsic.below");
         } else if (itsAlgorithm == 1) {
@@ -231,7 +231,7 @@ private:
             met("table." + kernel + ".none");
         } else {
             met("table." + kernel + '.' + std::to_string(magnitude / 64) + (d < 0 ? ".negative" : ".positive"));
-            met("table." + kernel + ".inverted", d < 0 && d % 64 == 0);
+            met("table." + kernel + ".inverted", d < 0 && d % 64 == 0 && d != -320);
         }
         return {wrap16(winner.value() + winner.pending), itsTable[static_cast<std::size_t>(d + 32768)]};
     }

@@ -55,7 +55,7 @@ TEST(UnitStimulus, MeetsEverySituationInEachPlaceWithoutRandomCases)
             }
         }
     }
-    EXPECT_EQ(met, 3 * (5 + 4 + 2 * 5 + 6 + 2 + 3 + 2 + 2) + 2 + 3 * 13);
+    EXPECT_EQ(met, 3 * (5 + 4 + 2 * 5 + 6 + 2 + 3 + 2 + 2) + 2 + 3 * 15);
 }
 
 TEST(UnitStimulus, GivesEveryCaseOfASmallUnitOnce)

@@ -1,6 +1,6 @@
 // WatchedDecision: a decision rule of the trellis that tells of wraps, ties and corrections.
-#ifndef MORVIK_HARDWARE_COVERAGE_WATCHEDDECISION_H
-#define MORVIK_HARDWARE_COVERAGE_WATCHEDDECISION_H
+#ifndef MORVIK_HARDWARE_TESTBENCH_WATCHEDDECISION_H
+#define MORVIK_HARDWARE_TESTBENCH_WATCHEDDECISION_H
 
 #include <cstdint>
 #include <type_traits>
@@ -8,7 +8,7 @@
 #include "rules/Trellis.h"
 #include "rules/TrellisDecision.h"
 
-namespace morvik::coverage {
+namespace morvik {
 
 /// Where a 16-bit result leaves its range.
 enum class Wrap : std::uint8_t { none, above, below };
@@ -28,11 +28,14 @@ constexpr std::int16_t pendingOf(const rules::PendingMetric<std::int16_t>& metri
     return metric.pending;
 }
 
-/// Decides as Rule does, and calls see(number, c1, c2) after each decision in which something can be seen: equal
-/// candidates, one that has wrapped, a difference that wraps; or after each one, if Rule has a table. Decisions of a
-/// recursion are numbered as they come; those of a ratio's tree, which begins with four, from 4 to 7 and towards the
-/// root, 1.
-template <class Rule, class See>
+/// Whether a rule corrects its decisions.
+template <class Rule>
+constexpr bool hasTable = !std::is_same_v<typename Rule::Metric, std::int16_t>;
+
+/// Decides as Rule does, and calls see(number, c1, c2) after each decision, or only after those in which something can
+/// be seen without a table: equal candidates, one that has wrapped, a difference that wraps. Decisions of a recursion
+/// are numbered as they come; those of a ratio's tree, which begins with four, from 4 to 7 and towards the root, 1.
+template <class Rule, class See, bool seesAll = hasTable<Rule>>
 class WatchedDecision {
 public:
     struct Metric {
@@ -78,10 +81,9 @@ public:
 
     MORVIK_INLINE Metric decide(const Metric& c1, const Metric& c2) const
     {
-        constexpr bool hasTable = !std::is_same_v<typename Rule::Metric, std::int16_t>;
         const std::int32_t difference = c1.value() - c2.value();
         const std::uint8_t number = c1.node == 0 ? itsNext++ : c1.node / 2;
-        if (hasTable || difference == 0 || wrapOf(difference) != Wrap::none || c1.wrap != Wrap::none ||
+        if (seesAll || difference == 0 || wrapOf(difference) != Wrap::none || c1.wrap != Wrap::none ||
             c2.wrap != Wrap::none) {
             itsSee(number, c1, c2);
         }
@@ -105,6 +107,6 @@ private:
     mutable std::uint8_t itsNext = 0;
 };
 
-}  // namespace morvik::coverage
+}  // namespace morvik
 
 #endif
