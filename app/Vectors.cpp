@@ -159,6 +159,9 @@ int make(Options options)
     coverage::Counts counts;
     const vectors::Manifest made =
         vectors::makeSet(options.output, manifest, options.situations.isCounted ? &counts : nullptr);
+    for (const std::string& file : vectors::filesOf(options.output, made)) {
+        base::expectDistinct(options.situations.counts, file);
+    }
     bool isCovered = true;
     const std::string situations = tellSituations(options.situations, made.settings, counts, isCovered);
     print(coreLine(made.settings.generics, made.settings.iterations) + base::visible(options.output) + ": " +

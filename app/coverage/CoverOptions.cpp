@@ -31,6 +31,21 @@ std::vector<std::string> coverWords()
     return words;
 }
 
+/// Refuses names of situations of which the core can meet none.
+void expectPossible(const vectors::Settings& settings)
+{
+    const coverage::Core core = coverage::coreOf(settings.generics);
+    for (const std::string& name : settings.cover) {
+        const std::vector<unsigned> named = coverage::situationsNamed(name);
+        const bool isPossible = std::any_of(
+            named.begin(), named.end(), [&core](unsigned number) { return !coverage::whyImpossible(number, core); });
+        if (!isPossible) {
+            throw base::Error("--cover: \"" + base::visible(name) + "\" cannot occur, as " +
+                              *coverage::whyImpossible(named.front(), core));
+        }
+    }
+}
+
 }  // namespace
 
 void addCoverOptions(CLI::App& command, CoverOptions& options, vectors::Settings& settings)
@@ -78,6 +93,7 @@ void checkCoverOptions(const CoverOptions& options, const vectors::Settings& set
     if (!options.isCounted && (!options.counts.empty() || !settings.cover.empty())) {
         throw base::Error("--no-situations cannot be combined with --coverage and --cover, which count them");
     }
+    expectPossible(settings);
     if (!options.counts.empty() && options.counts != base::standardStream) {
         base::checkWritable(options.counts);
     }

@@ -47,7 +47,7 @@ std::string padded(std::string text, std::size_t width)
 std::string lineOf(const coverage::Situation& situation, const std::string& count)
 {
     constexpr std::size_t widestRule = 3;
-    constexpr std::size_t widestName = 26;
+    constexpr std::size_t widestName = 28;
     constexpr std::size_t widestCount = 10;
     return padded("", widestRule - std::to_string(situation.rule).size()) + std::to_string(situation.rule) + "  " +
            padded(situation.name, widestName) + (count.empty() ? "" : padded(count, widestCount)) + situation.text +
@@ -165,6 +165,10 @@ std::vector<std::string> filesOf(const std::vector<std::string>& inputs)
 int run(const Options& options)
 {
     if (options.list) {
+        if (!options.inputs.empty() || !options.output.empty() || !options.report.empty() || options.all ||
+            options.json) {
+            throw base::Error("--list prints all situations, and takes nothing else; see 'morvik coverage --help'");
+        }
         print(listText());
         return success;
     }

@@ -75,6 +75,11 @@ void checkPort(vpiHandle object, const Port& port, bool isOutput)
                       std::to_string(port.count) + " values of " + std::to_string(units::rangeOf(port.kind).bits) +
                       " bits have " + std::to_string(widthOf(port)));
     }
+    // An address may be in a narrower register, if that is enough for the block size.
+    if (port.count == 1 && isOutput && width < widthOf(port) && port.kind != units::Kind::step) {
+        throw Mistake(std::string(port.name) + " has " + std::to_string(width) + " bits, but its values have " +
+                      std::to_string(widthOf(port)));
+    }
     if (isOutput && (isConstant(object) || vpi_get(vpiType, object) == vpiNet)) {
         throw Mistake(std::string(port.name) + " receives a result, so it must be a variable");
     }

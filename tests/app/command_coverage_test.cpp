@@ -137,9 +137,10 @@ TEST_F(Coverage, ListsAllSituations)
 {
     const CommandResult listed = run("coverage", {"--list"});
     EXPECT_EQ(listed.status, 0);
-    EXPECT_EQ(listed.out.rfind("  2  wrap.sum.above            Forward plus backward metric is above 2047", 0), 0U)
+    EXPECT_EQ(listed.out.rfind("  2  wrap.sum.above              Forward plus backward metric is above 2047", 0), 0U)
         << listed.out;
     EXPECT_EQ(std::count(listed.out.begin(), listed.out.end(), '\n'), 186);
+    EXPECT_NE(listed.out.find(" 14  extrinsic.rounded.positive  A positive scaled value"), std::string::npos);
 }
 
 TEST_F(Coverage, IsDrawnAsAPage)
@@ -175,6 +176,27 @@ TEST_F(Coverage, RefusesWhatIsNotAllowed)
     expectRefused("vectors",
                   {"--out", "set", "--cover", "tie", "--no-situations"},
                   "--no-situations cannot be combined with --coverage and --cover, which count them");
+    for (const auto& [name, reason] : {std::pair("table", "scaled has no table"),
+                                       std::pair("segments.32", "no block size gives it on 2 units"),
+                                       std::pair("core.max-log", "the core is another one")}) {
+        expectRefused("vectors",
+                      {"--out", "set", "--cover", std::string("tie,") + name},
+                      std::string("--cover: \"") + name + "\" cannot occur, as " + reason);
+    }
+    for (const char* const other : {"one.csv", "--json", "--all"}) {
+        expectRefused("coverage",
+                      {"--list", other},
+                      "--list prints all situations, and takes nothing else; see 'morvik coverage --help'");
+    }
+}
+
+TEST_F(Coverage, IsNotWrittenOverTheSetThatItIsOf)
+{
+    makeOne("set", "1");
+    expectRefused("vectors",
+                  {"--out", "set", "--block-size", "40", "--no-directed", "--coverage", "set/manifest.json"},
+                  "set/manifest.json: is the same file as set/manifest.json, each output needs its own");
+    EXPECT_EQ(run("vectors", {"--check", "set"}).status, 0);
 }
 
 }  // namespace

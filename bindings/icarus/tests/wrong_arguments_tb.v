@@ -27,6 +27,7 @@ module wrong_arguments_tb;
         status = $morvik_unit_branch(1, 2, 3);
         status = $morvik_unit_extrinsic(values, 2, 3, status);
         status = $morvik_unit_address(40, 2, nets[0]);
+        status = $morvik_unit_intrinsic(1, 2, status[7:0]);
         $display("the simulation has begun");
     end
 endmodule
