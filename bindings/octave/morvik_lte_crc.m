@@ -16,6 +16,6 @@ function parity = morvik_lte_crc(bits, kind)
     elseif nargin < 2
         kind = '24a';
     end
-    place = morvik_lte_choice('morvik_lte_crc', 'kind', kind, {'24a', '24b'});
+    place = morvik_choice('morvik_lte_crc', 'kind', kind, {'24a', '24b'});
     parity = morvik_lte_call('morvik_lte_crc', 'crc', morvik_lte_bits('morvik_lte_crc', 'bits', bits), place - 1);
 end

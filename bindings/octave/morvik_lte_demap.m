@@ -19,9 +19,9 @@ function ratios = morvik_lte_demap(symbols, modulation, noise_variance, varargin
     if nargin < 3
         error('morvik:badCall', '%s: needs symbols, the modulation and the variance of the noise', caller);
     end
-    options = morvik_lte_options(caller, struct('gains', [], 'demapper', 'max-log'), varargin);
+    options = morvik_options(caller, struct('gains', [], 'demapper', 'max-log'), varargin);
     count = morvik_lte_modulation(caller, modulation);
-    demapper = morvik_lte_choice(caller, 'demapper', options.demapper, {'max-log', 'exact'}) - 1;
+    demapper = morvik_choice(caller, 'demapper', options.demapper, {'max-log', 'exact'}) - 1;
     if ~isnumeric(symbols) || issparse(symbols) || ndims(symbols) > 2 || count == 1 && ~isreal(symbols)
         error('morvik:badClass', '%s: symbols have to be a full matrix of numbers, real for bpsk', caller);
     elseif any(~isfinite(single(symbols(:))))

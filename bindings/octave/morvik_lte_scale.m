@@ -18,7 +18,7 @@ function scale = morvik_lte_scale(modulation, code_rate, algorithm)
     elseif nargin < 3
         algorithm = 'scaled';
     end
-    number = morvik_lte_choice(caller, 'algorithm', algorithm, {'max-log', 'scaled', 'table'}) - 1;
+    number = morvik_choice(caller, 'algorithm', algorithm, {'max-log', 'scaled', 'table'}) - 1;
     scale = morvik_lte_call(caller, 'ratio_scale', number, morvik_lte_modulation(caller, modulation), ...
         morvik_lte_positive(caller, 'code_rate', code_rate));
 end

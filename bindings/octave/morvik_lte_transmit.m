@@ -24,11 +24,11 @@ function ratios = morvik_lte_transmit(bits, modulation, esn0_db, varargin)
     if nargin < 3
         error('morvik:badCall', '%s: needs bits, the modulation and Es/N0', caller);
     end
-    options = morvik_lte_options(caller, struct('channel', 'awgn', 'demapper', 'max-log', 'seed', []), varargin);
+    options = morvik_options(caller, struct('channel', 'awgn', 'demapper', 'max-log', 'seed', []), varargin);
     count = morvik_lte_modulation(caller, modulation);
     bits = morvik_lte_symbols(caller, bits, count);
-    channel = morvik_lte_choice(caller, 'channel', options.channel, {'awgn', 'rayleigh', 'block-rayleigh'}) - 1;
-    demapper = morvik_lte_choice(caller, 'demapper', options.demapper, {'max-log', 'exact'}) - 1;
+    channel = morvik_choice(caller, 'channel', options.channel, {'awgn', 'rayleigh', 'block-rayleigh'}) - 1;
+    demapper = morvik_choice(caller, 'demapper', options.demapper, {'max-log', 'exact'}) - 1;
     is_number = isnumeric(esn0_db) && isscalar(esn0_db) && isreal(esn0_db);
     if ~is_number || ~(abs(esn0_db) <= 50) || abs(1000 * esn0_db - round(1000 * esn0_db)) > 1e-6
         error('morvik:badValue', '%s: esn0_db has to be a number from -50 to 50, in steps of 0.001', caller);

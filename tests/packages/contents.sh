@@ -76,6 +76,12 @@ for file in man/man1/morvik.1.gz man/man1/morvik-ber.1.gz bash-completion/comple
     [ -s "$share/$file" ] || fail "There is no share/$file"
 done
 
+echo "The sources for simulators"
+for file in systemverilog/{morvik_pkg.sv,decoder_env_pkg.sv,morvik_dpi.h} vhdl/morvik_{,checker_,units_}pkg.vhd \
+    systemc/Morvik{Decoder,Checker,Units}.h; do
+    [ -s "$share/morvik/$file" ] || fail "There is no share/morvik/$file"
+done
+
 echo "The examples, by pkg-config"
 mkdir programs
 PKG_CONFIG_LIBDIR=$LD_LIBRARY_PATH/pkgconfig OUT=$folder/programs make -s -C "$share/doc/$development/examples" check
@@ -86,6 +92,7 @@ if [ "$architecture" = amd64 ]; then
     depends gr-morvik gnuradio
     depends gr-morvik python3-morvik
     depends octave-morvik octave-abi-57
+    depends octave-morvik "$checker"
     echo "Python"
     PYTHONPATH=$folder/root/usr/lib/python3/dist-packages /usr/bin/python3 -c "
 import morvik, numpy
@@ -107,5 +114,6 @@ assert morvik.__version__ == '${version%-1}'
         [a, b, c] = morvik_encode(bits);
         assert(isequal(morvik_decode(16 * (2 * a - 1), 16 * (2 * b - 1), 16 * (2 * c - 1)), bits));
         assert(~any(morvik_lte_crc([bits; morvik_lte_crc(bits)])(:)));
+        assert(morvik_unit_intrinsic(10, -24), int16(-19));
         printf('%s\n', which('morvik_decode'))" | grep -F "$functions"
 fi

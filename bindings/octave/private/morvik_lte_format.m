@@ -3,7 +3,7 @@
 function [format, options] = morvik_lte_format(caller, transport_block_size, coded_bits, modulation, more, given)
     more.layers = 1;
     more.soft_buffer_size = 0;
-    options = morvik_lte_options(caller, more, given);
+    options = morvik_options(caller, more, given);
     if isfield(options, 'version')
         options.version = morvik_lte_number(caller, 'version', options.version, 0, 3);
     end

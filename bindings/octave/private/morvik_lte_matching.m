@@ -3,7 +3,7 @@
 function [matching, options] = morvik_lte_matching(caller, K, more, given)
     more.fillers = 0;
     more.buffer_size = 0;
-    options = morvik_lte_options(caller, more, given);
+    options = morvik_options(caller, more, given);
     version = 0;
     if isfield(options, 'version')
         version = morvik_lte_number(caller, 'version', options.version, 0, 3);

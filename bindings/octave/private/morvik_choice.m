@@ -1,5 +1,5 @@
 % The place of a word among those that are allowed.
-function place = morvik_lte_choice(caller, name, word, words)
+function place = morvik_choice(caller, name, word, words)
     place = find(strcmp(word, words));
     if ~ischar(word) || isempty(place)
         error('morvik:badOption', '%s: %s has to be one of %s', caller, name, strjoin(words, ', '));

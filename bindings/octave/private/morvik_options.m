@@ -1,5 +1,5 @@
 % The options with what a call gives, a list of names and values.
-function options = morvik_lte_options(caller, options, given)
+function options = morvik_options(caller, options, given)
     names = fieldnames(options);
     if mod(numel(given), 2) ~= 0
         error('morvik:badCall', '%s: every option needs a value', caller);
