@@ -43,7 +43,9 @@ file(RELATIVE_PATH to_libraries ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FUL
 # The build's library is in ../lib, so that installation need not rewrite the command.
 set(runtime_path "$ORIGIN/${to_libraries}" "$ORIGIN/../lib")
 list(REMOVE_DUPLICATES runtime_path)
-set_target_properties(${commands} PROPERTIES INSTALL_RPATH "${runtime_path}" BUILD_WITH_INSTALL_RPATH ON)
+if(NOT MORVIK_STATIC_COMMAND)
+    set_target_properties(${commands} PROPERTIES INSTALL_RPATH "${runtime_path}" BUILD_WITH_INSTALL_RPATH ON)
+endif()
 install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT command)
 
 # Manual pages, completions, and the documents that they refer to.
