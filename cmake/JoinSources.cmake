@@ -1,6 +1,5 @@
 # Compiles the sources of libraries several at a time, those that define no name twice; a source whose names change
 # configures the build anew.
-find_package(Python3 REQUIRED COMPONENTS Interpreter)
 
 function(morvik_join_sources library)
     get_target_property(folder ${library} SOURCE_DIR)
@@ -9,7 +8,7 @@ function(morvik_join_sources library)
     set(paths ${sources})
     list(TRANSFORM paths PREPEND ${folder}/)
     execute_process(
-        COMMAND ${Python3_EXECUTABLE} -B ${PROJECT_SOURCE_DIR}/scripts/join-sources ${paths}
+        COMMAND ${PROJECT_SOURCE_DIR}/scripts/join-sources ${paths}
         OUTPUT_VARIABLE units OUTPUT_STRIP_TRAILING_WHITESPACE
         COMMAND_ERROR_IS_FATAL ANY)
     foreach(source unit IN ZIP_LISTS paths units)

@@ -117,8 +117,9 @@ stage_memory() {
 stage_memory-short() {
     local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance|NamesNoMistakeThat'
     many+='|FindsTheSoftBuffer|FindsScales|FindsMistakesBy'
-    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Self(Test|Check\.FindsTheLibraryRight)|Faults/FaultyCore|Stages/Mistakes"
-    long+='|Coverage\.IsWholeInASet'
+    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Faults/FaultyCore|Stages/Mistakes|Coverage\.IsWholeInASet"
+    long+='|Self(Test|Check\.(FindsTheLibraryRight|Notices(TheLast|Another|Other)))|VcdDump\.RefusesTimesWithoutAnEnd'
+    long+='|Sizes/ModelValues\.FollowFromEachOther/(2560|6144)$'
     local scripts='example_sweep|core_from_document|default_core'
     memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"
 }

@@ -387,7 +387,7 @@ TEST_P(LaneDecoder, EachValueBeyondTheFormatIsNoticed)
 #if defined(__OPTIMIZE__) && !defined(__SANITIZE_ADDRESS__)
 constexpr unsigned combinationsPerOneTaken = 1;
 #else
-constexpr unsigned combinationsPerOneTaken = 17;
+constexpr unsigned combinationsPerOneTaken = 67;
 #endif
 
 /// Each block size with each number of units and each algorithm type, each of them with another number of
