@@ -103,6 +103,7 @@ public:
             addStuckBits(bits);
             addStuckBitsTogether(bits, faults);
             addStuckWord(faults.front().got);
+            addConstant(faults.front().got - faults.front().wanted, bits);
         }
         if (stage == Stage::intrinsic) {
             addStuckApriori(faults);
@@ -127,7 +128,8 @@ private:
                                  known.reach,
                                  [columns](const Sample& sample) { return columns->fit(sample.place, sample.got); },
                                  known.family,
-                                 known.detail});
+                                 known.detail,
+                                 changesIntrinsic(known.mistake)});
     }
 
     /// A mask keeps the bits that a wrong border column has, and clears those that it lacks. Of other bits, nothing is
@@ -337,6 +339,15 @@ private:
             return;  // known as zeros
         }
         addRelation("values stay at " + std::to_string(word), [word](int got, int) { return got == word; });
+    }
+
+    /// An offset, before a register that holds its ends or behind it.
+    void addConstant(int offset, int bits)
+    {
+        addRelation("a constant of " + std::to_string(offset) + " is added", [offset, bits](int got, int wanted) {
+            const int end = 1 << (bits - 1);
+            return got == wanted + offset || got == rules::clip(wanted + offset, -end, end - 1);
+        });
     }
 
     void addFlippedBits(int bits)

@@ -37,6 +37,8 @@ struct Candidate {
     /// detail win: a factor of 0.5 needs no 33/64.
     unsigned family = 0;
     unsigned detail = 0;
+    /// Whether it computes an intrinsic value from its inputs. Others take it from the dump, which lacks its last bit.
+    bool recomputes = false;
 };
 
 /// All candidates for the faults of a stage. The arguments must outlive them.

@@ -3,8 +3,10 @@
 #ifndef MORVIK_HARDWARE_COMPARISON_DECISIONS_H
 #define MORVIK_HARDWARE_COMPARISON_DECISIONS_H
 
+#include <algorithm>
 #include <array>
 #include <cstdint>
+#include <cstdlib>
 
 #include "rules/Trellis.h"
 #include "rules/TrellisDecision.h"
@@ -39,6 +41,32 @@ constexpr Held select(Held difference, Held c1, Held c2)
 constexpr Held maxWrap(Held c1, Held c2)
 {
     return c1.value < c2.value ? c2 : c1;
+}
+
+/// A metric that wraps, of hardware that compares metrics as plain numbers.
+struct Plain {
+    std::int16_t value = 0;
+    bool isLess = false;  ///< of a difference: whether the first number is less than the second
+};
+
+constexpr Plain addWrap(Plain a, Plain b)
+{
+    return {rules::addWrap(a.value, b.value)};
+}
+
+constexpr Plain subWrap(Plain a, Plain b)
+{
+    return {rules::subWrap(a.value, b.value), a.value < b.value};
+}
+
+constexpr Plain select(Plain difference, Plain c1, Plain c2)
+{
+    return difference.isLess ? c2 : c1;
+}
+
+constexpr Plain maxWrap(Plain c1, Plain c2)
+{
+    return select(subWrap(c1, c2), c1, c2);
 }
 
 /// A metric in a tree of decisions, one of which takes the lesser candidate.
@@ -91,21 +119,29 @@ constexpr std::int16_t wordOf(Held value)
     return value.value;
 }
 
+constexpr std::int16_t wordOf(Plain value)
+{
+    return value.value;
+}
+
 constexpr std::int16_t wordOf(Leaf value)
 {
     return value.value;
 }
 
 /// The table of TCalculationEngineModBase::createLUT, called with a decision difference. Words of narrower registers
-/// are shifted up by the bits that they lack.
+/// are shifted up by the bits that they lack. Hardware that does not invert a negative difference takes its magnitude.
 template <class Value>
 struct Corrections {
     const unsigned char* middle;
     unsigned shift = 0;
+    bool inverts = true;
 
     Value operator()(Value difference) const
     {
-        return fromWord<Value>(static_cast<std::int16_t>(middle[wordOf(difference) >> shift] << shift));
+        const int word = wordOf(difference) >> shift;
+        const int index = inverts ? word : std::min(std::abs(word), INT16_MAX);
+        return fromWord<Value>(static_cast<std::int16_t>(middle[index] << shift));
     }
 };
 

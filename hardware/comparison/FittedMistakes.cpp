@@ -19,6 +19,7 @@ struct Memory {
 };
 
 constexpr Memory aprioriMemory = {Mistake::aprioriMisread, "extrinsic values", " (rule 15)"};
+constexpr Memory naturalMemory = {Mistake::aprioriMisreadByBit, "extrinsic values in natural order", " (rule 15)"};
 constexpr Memory systematicMemory = {Mistake::systematicMisread, "systematic values", " (rule 15)"};
 constexpr Memory parityMemory = {Mistake::parityMisread, "parity values", " (rule 5)"};
 constexpr Memory branchMemory = {Mistake::branchMisread, "branch metrics", " (rules 6 and 8)"};
@@ -29,7 +30,7 @@ std::vector<Memory> memoriesOf(Stage stage)
 {
     switch (stage) {
     case Stage::intrinsic:
-        return {aprioriMemory, systematicMemory};
+        return {aprioriMemory, naturalMemory, systematicMemory};
     case Stage::branch:
         return {parityMemory};
     case Stage::forward:
@@ -78,9 +79,15 @@ private:
         itsMistakes.push_back({mistake, std::move(text), Candidate::operation, Candidate::telling, family, detail});
     }
 
+    /// The same for both orders of extrinsic values.
     static unsigned addressesOf(const Memory& memory)
     {
-        return addresses + static_cast<unsigned>(memory.misread);
+        return addresses + static_cast<unsigned>(isNatural(memory) ? aprioriMemory.misread : memory.misread);
+    }
+
+    static bool isNatural(const Memory& memory)
+    {
+        return memory.misread == naturalMemory.misread;
     }
 
     void addStuckBits(const Memory& memory, AddressError::Range range, unsigned end)
@@ -88,17 +95,19 @@ private:
         const char* const within = range == AddressError::block     ? ""
                                    : range == AddressError::segment ? " within a segment"
                                                                     : " within a window";
+        constexpr unsigned ranges = 3;
+        const unsigned detail = range + (isNatural(memory) ? ranges : 0);
         for (unsigned bit = 0; (end - 1) >> bit != 0; ++bit) {
             const std::string address =
                 "bit " + std::to_string(bit) + " of the address of " + memory.values + within + " reads as ";
             add({memory.misread, AddressError{AddressError::stuckLow, bit, range}},
                 address + "0" + memory.rule,
                 addressesOf(memory),
-                range);
+                detail);
             add({memory.misread, AddressError{AddressError::stuckHigh, bit, range}},
                 address + "1" + memory.rule,
                 addressesOf(memory),
-                range);
+                detail);
         }
     }
 
@@ -109,7 +118,7 @@ private:
             add({memory.misread, AddressError{AddressError::held, step}},
                 "the address of " + std::string(memory.values) + " stays at " + std::to_string(step) + memory.rule,
                 addressesOf(memory),
-                0);
+                isNatural(memory) ? 1 : 0);
         }
     }
 

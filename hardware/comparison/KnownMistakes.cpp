@@ -69,13 +69,14 @@ constexpr NamedMistake startingCode = {
     Mistake::otherCodeFirst, "each half-iteration decodes the other code: half-iteration 0 the natural one (rule 15)"};
 
 /// Mistakes in the a-priori and the systematic value, in the register or where they are used.
-constexpr std::array<NamedMistake, 3> partMistakes = {{
+constexpr std::array<NamedMistake, 4> partMistakes = {{
     {Mistake::aprioriWhole, "the a-priori value counts in full, not half (rule 13)"},
     {Mistake::aprioriQuartered, "the a-priori value is halved twice (rule 13)"},
     {Mistake::systematicMissing, "the systematic value is missing (rule 13)"},
+    {Mistake::intrinsicCut, "the intrinsic value lacks its bit below an eighth (rule 13)"},
 }};
 
-constexpr std::array<NamedMistake, 12> intrinsicMistakes = {{
+constexpr std::array<NamedMistake, 14> intrinsicMistakes = {{
     {Mistake::aprioriMissing, "the extrinsic values of the pass before do not arrive (rule 13)"},
     {Mistake::aprioriOfPassBefore, "a pass late: extrinsic values are those of the pass before the last (rule 13)"},
     {Mistake::aprioriUnpermuted, "extrinsic values are taken without the interleaver's permutation (rule 15)"},
@@ -86,6 +87,12 @@ constexpr std::array<NamedMistake, 12> intrinsicMistakes = {{
      "extrinsic values are written to the address after their own, or read from the one before (rule 15)"},
     {{Mistake::aprioriMisread, AddressError{AddressError::behind}},
      "extrinsic values are written to the address before their own, or read from the one after (rule 15)"},
+    {{Mistake::aprioriMisreadByBit, AddressError{AddressError::before}},
+     "extrinsic values in natural order are written to the address after their own, or read from the one before (rule "
+     "15)"},
+    {{Mistake::aprioriMisreadByBit, AddressError{AddressError::behind}},
+     "extrinsic values in natural order are written to the address before their own, or read from the one after (rule "
+     "15)"},
     {Mistake::systematicUnpermuted, "systematic values are in the other code's order (rule 15)"},
     {{Mistake::intrinsicTimes, 1}, "the sum is not halved (rule 13)"},
     {{Mistake::intrinsicTimes, -1}, "the sum is halved twice (rule 13)"},
@@ -118,10 +125,13 @@ constexpr std::array<NamedMistake, 3> narrowingMistakes = {{
 }};
 
 /// Mistakes in metrics and ratios.
-constexpr std::array<NamedMistake, 5> metricMistakes = {{
+constexpr std::array<NamedMistake, 7> metricMistakes = {{
     {Mistake::unwrapped, "the wrap is missing: values saturate (rule 2)"},
+    {Mistake::comparedPlainly, "metrics are compared as plain numbers, though they wrap (rule 3)"},
     {Mistake::uncorrected, "the correction table is missing (rule 7)"},
     {Mistake::correctedAtOnce, "corrections come a decision early (rule 7)"},
+    {Mistake::correctedByMagnitude,
+     "the correction table is read by the magnitude of a negative difference, which is not inverted (rule 9)"},
     {{Mistake::branchMisread, AddressError{AddressError::before}},
      "the branch metrics are those of the step before (rules 6 and 8)"},
     {{Mistake::branchMisread, AddressError{AddressError::behind}},
@@ -129,7 +139,7 @@ constexpr std::array<NamedMistake, 5> metricMistakes = {{
 }};
 
 constexpr std::array<NamedMistake, 8> ratioMistakes = {{
-    {Mistake::ratioHeld, "the wrap is missing: values stay at the end of the range (rule 2)"},
+    {{Mistake::ratioHeld, rules::stateBits}, "the wrap is missing: values stay at the end of the range (rule 2)"},
     {Mistake::branchMissing, "the branch metrics are missing (rule 8)"},
     {Mistake::aprioriMissing, "the branch metrics lack the a-priori value (rule 8)"},
     {Mistake::intrinsicMissing, "the branch metrics lack the intrinsic value (rule 8)"},
@@ -238,6 +248,7 @@ public:
         case Stage::ratio:
             addMetrics();
             addNamed(ratioMistakes);
+            addSizes({Mistake::ratioHeld, "the ratio is clipped to ", " bits, not wrapped at twelve (rule 2)"}, 5, 11);
             addNamed(partMistakes);
             addNamed(deadMemories, Candidate::place);
             addDecisionsOfRatio();

@@ -36,16 +36,18 @@ struct Mistake {
         aprioriInverse,       ///< by the inverse permutation
         aprioriBefore,        ///< by the interleaver's address for the step before
         aprioriBehind,
-        aprioriMisread,     ///< from the wrong address
-        aprioriStuck,       ///< `number` eighths, whatever was written
-        aprioriWhole,       ///< not halved
-        aprioriQuartered,   ///< halved twice
-        aprioriMask,        ///< the low `number` bits of half the a-priori value, an aligned word, cleared
-        systematicMissing,  ///< 0 for the systematic value
+        aprioriMisread,       ///< from the wrong address, the step of the pass before
+        aprioriMisreadByBit,  ///< from the wrong address, the number of the bit in both passes
+        aprioriStuck,         ///< `number` eighths, whatever was written
+        aprioriWhole,         ///< not halved
+        aprioriQuartered,     ///< halved twice
+        aprioriMask,          ///< the low `number` bits of half the a-priori value, an aligned word, cleared
+        systematicMissing,    ///< 0 for the systematic value
         systematicMisread,
         systematicUnpermuted,  ///< systematic values in the natural order, on the interleaved code
         intrinsicWrapped,      ///< the sum cut to `number` bits before it is halved
         intrinsicClipped,      ///< the sum clipped to `number` bits before it is halved
+        intrinsicCut,          ///< without the bit below an eighth
         intrinsicTimes,        ///< the intrinsic value counts 2^`number` times as much
         intrinsicMissing,
         intrinsicMisread,
@@ -61,7 +63,8 @@ struct Mistake {
         clippedSymmetric,    ///< to -127 and 127
         wrappedTo,           ///< their low `number` bits
         unwrapped,           ///< metrics and ratios saturate
-        ratioHeld,           ///< only the last difference of the ratio saturates
+        ratioHeld,           ///< only the last difference of the ratio saturates, in `number` bits
+        comparedPlainly,     ///< metrics wrap, but are compared as plain numbers
         storedIn,            ///< metrics and ratios cut to `number` bits once decided
         computedIn,          ///< in registers and adders of `number` bits
         lesser,              ///< a decision for the lesser candidate: for state `number`, or see TreeNode
@@ -90,13 +93,14 @@ struct Mistake {
         segmentsShifted,     ///< the first step of each segment's forward recursion is `number` steps behind
         tailOrder,           ///< the tail's values in the order of tailOrders[number]
         tailOfOtherCode,
-        tailClipped,         ///< the branch sums of the tail clipped to `number` bits
-        tailWrapped,         ///< the branch sums of the tail cut to `number` bits
-        scaledBy,            ///< extrinsic values multiplied by `number` / factorUnits
-        clippedBeforeScale,  ///< the difference clipped to `number` bits before it is scaled
-        wrappedBeforeScale,  ///< the difference cut to `number` bits before it is scaled
-        uncorrected,         ///< decisions without the correction table
-        correctedAtOnce,     ///< corrections added to their own decision, not to the next
+        tailClipped,           ///< the branch sums of the tail clipped to `number` bits
+        tailWrapped,           ///< the branch sums of the tail cut to `number` bits
+        scaledBy,              ///< extrinsic values multiplied by `number` / factorUnits
+        clippedBeforeScale,    ///< the difference clipped to `number` bits before it is scaled
+        wrappedBeforeScale,    ///< the difference cut to `number` bits before it is scaled
+        uncorrected,           ///< decisions without the correction table
+        correctedAtOnce,       ///< corrections added to their own decision, not to the next
+        correctedByMagnitude,  ///< the table read by the magnitude of a negative difference, which is not inverted
     };
 
     constexpr Mistake(Kind what = none, int size = 0) : kind(what), number(size) {}
@@ -116,6 +120,21 @@ struct Mistake {
     int number = 0;
     AddressError address;
 };
+
+/// Whether an intrinsic value is wrong where it is used, though its register is right: it is computed anew.
+constexpr bool changesIntrinsic(const Mistake& mistake)
+{
+    switch (mistake.kind) {
+    case Mistake::aprioriMissing:
+    case Mistake::aprioriWhole:
+    case Mistake::aprioriQuartered:
+    case Mistake::systematicMissing:
+    case Mistake::intrinsicCut:
+        return true;
+    default:
+        return false;
+    }
+}
 
 /// The denominator of factors.
 constexpr int factorUnits = 64;
@@ -144,7 +163,7 @@ struct TailOrder {
     std::array<unsigned, 6> from;
 };
 
-constexpr std::array<TailOrder, 8> tailOrders = {{
+constexpr std::array<TailOrder, 10> tailOrders = {{
     {"systematic and parity values of the tail are swapped", {1, 0, 3, 2, 5, 4}},
     {"the tail's steps are in reverse", {4, 5, 2, 3, 0, 1}},
     {"the tail's values are in reverse", {5, 4, 3, 2, 1, 0}},
@@ -153,6 +172,8 @@ constexpr std::array<TailOrder, 8> tailOrders = {{
     {"the tail's systematic values come first, then its parity, but are taken in turn", {0, 2, 4, 1, 3, 5}},
     {"the tail's values are taken a step late", {4, 5, 0, 1, 2, 3}},
     {"the tail's values are taken a step early", {2, 3, 4, 5, 0, 1}},
+    {"the tail's first two steps are swapped", {2, 3, 0, 1, 4, 5}},
+    {"the tail's last two steps are swapped", {0, 1, 4, 5, 2, 3}},
 }};
 
 }  // namespace morvik::comparison

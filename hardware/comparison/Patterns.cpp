@@ -88,6 +88,15 @@ private:
         return faults.empty() ? itsComparison.faults : faults;  // those of one stage, if none is left
     }
 
+    /// Whether all values follow from the dump's own: it lacks the last bit of intrinsic values, and they show another
+    /// one than the inputs give.
+    bool follow(const std::vector<Fault>& faults)
+    {
+        return std::all_of(faults.begin(), faults.end(), [this](const Fault& fault) {
+            return follows(fault.place).value == fault.got;
+        });
+    }
+
     /// Counts distinct faults, up to `telling`. The tail has the same values in each pass, so one pass says as much as
     /// all.
     static std::size_t distinct(const std::vector<Fault>& faults)
@@ -107,7 +116,7 @@ private:
 
     struct Following {
         std::int16_t value;
-        bool complete;
+        Sources sources;
     };
 
     Following follows(const Place& place)
@@ -118,7 +127,7 @@ private:
             itsColumn = itsReplay.column(place.pass, stage, place.step);
             itsPlace = place;
         }
-        return {itsColumn.values[place.signal - signalsOf(stage).first], itsColumn.sources.complete};
+        return {itsColumn.values[place.signal - signalsOf(stage).first], itsColumn.sources};
     }
 
     /// The right values of a stage; only those of the first differing pass if the dump lacks inputs.
@@ -149,7 +158,8 @@ private:
     bool isRight(const Place& place)
     {
         const Following wanted = follows(place);
-        return (wanted.complete || !itsComparison.inputsAreKnown) && wanted.value == itsDump.at(place);
+        return (wanted.sources.complete || !itsComparison.inputsAreKnown) && !wanted.sources.inferred &&
+               wanted.value == itsDump.at(place);
     }
 
     /// The fraction of the faults that the candidate explains; 0 if it contradicts more than it may, or says nothing of
@@ -209,7 +219,11 @@ private:
         const std::vector<Fault> some = sampleOf(faults, probed);
         std::vector<Candidate> best;
         auto rank = Candidate::descriptive;
+        const bool isOfLastBit = follow(faults);
         for (const Candidate& each : candidates(itsModel, itsReplay, faults)) {
+            if (isOfLastBit && !each.recomputes) {
+                continue;  // all would follow without a mistake, too
+            }
             const double part = explainedBy(each, some, enoughOfProbe) > 0 ? explainedBy(each, faults) : 0;
             const bool isBetter = part > finding.explained || each.rank < rank;
             if (part <= 0 || part < finding.explained || (!isBetter && each.rank > rank)) {

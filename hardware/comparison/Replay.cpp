@@ -29,20 +29,6 @@ int narrowed(int value, Mistake mistake)
     }
 }
 
-/// Whether an intrinsic value is wrong where it is used, though its register is right: it is computed anew.
-bool changesIntrinsic(Mistake mistake)
-{
-    switch (mistake.kind) {
-    case Mistake::aprioriMissing:
-    case Mistake::aprioriWhole:
-    case Mistake::aprioriQuartered:
-    case Mistake::systematicMissing:
-        return true;
-    default:
-        return false;
-    }
-}
-
 /// Twice the intrinsic value as it counts under the mistake.
 int counted(int twice, Mistake mistake)
 {
@@ -165,6 +151,12 @@ unsigned Replay::aprioriStep(unsigned pass, unsigned trellisStep, Mistake mistak
         return order[(trellisStep + K - 1) % K];
     case Mistake::aprioriBehind:
         return order[(trellisStep + 1) % K];
+    case Mistake::aprioriMisreadByBit: {
+        const bool isNatural = codeOf(pass) == 0;
+        const unsigned bit = isNatural ? trellisStep : order[trellisStep];
+        const unsigned read = addressed(bit, mistake, Mistake::aprioriMisreadByBit, sources);
+        return isNatural ? order[read] : read;
+    }
     default:
         return addressed(order[trellisStep], mistake, Mistake::aprioriMisread, sources);
     }
@@ -204,6 +196,7 @@ int Replay::twiceIntrinsicFromInputs(unsigned pass, unsigned trellisStep, Mistak
     const int sum = rules::twiceIntrinsicValue(apriori, systematicValue(pass, trellisStep, mistake, sources), mask);
     return mistake == Mistake::intrinsicWrapped   ? cutTo(sum, mistake.number)
            : mistake == Mistake::intrinsicClipped ? clippedTo(sum, mistake.number)
+           : mistake == Mistake::intrinsicCut     ? sum & ~eighth
                                                   : sum;
 }
 
@@ -224,7 +217,7 @@ Replay::TwiceIntrinsic Replay::twiceIntrinsic(unsigned pass,
     const int other = likely ^ eighth;
     const bool isOther = !givesWhatFollows(pass, trellisStep, likely, inRegister) &&
                          givesWhatFollows(pass, trellisStep, other, inRegister);
-    return {isOther ? other : likely, isComputed && ofInputs.complete};
+    return {isOther ? other : likely, isOther && isComputed, isComputed && ofInputs.complete};
 }
 
 bool Replay::isInDump(unsigned pass, Stage stage, unsigned trellisStep, const Column& column) const
@@ -245,9 +238,10 @@ Column Replay::fromTwiceIntrinsic(
 {
     Sources sources;
     const unsigned from = addressed(trellisStep, mistake, Mistake::intrinsicMisread, sources);
-    const TwiceIntrinsic twice = changesIntrinsic(mistake)
-                                     ? TwiceIntrinsic{twiceIntrinsicFromInputs(pass, from, mistake, sources), true}
-                                     : twiceIntrinsic(pass, from, mistake, sources);
+    const TwiceIntrinsic twice =
+        changesIntrinsic(mistake) ? TwiceIntrinsic{twiceIntrinsicFromInputs(pass, from, mistake, sources), false, true}
+                                  : twiceIntrinsic(pass, from, mistake, sources);
+    sources.inferred = twice.isInferred;
     const auto likely = compute(twice.value, sources);
     const Column column = inEighths(likely, sources);
     if (twice.isSure || isInDump(pass, stage, trellisStep, column)) {

@@ -15,7 +15,9 @@ namespace morvik::comparison {
 /// Where the inputs of an operation come from.
 struct Sources {
     bool complete = true;  ///< whether all inputs are in the dump
-    bool open = false;     ///< whether the mistake leaves open what an input is, as beyond the end of a memory
+    /// Whether the last bit of an intrinsic value is taken from what was computed from it, against its own inputs.
+    bool inferred = false;
+    bool open = false;  ///< whether the mistake leaves open what an input is, as beyond the end of a memory
 };
 
 /// The result of an operation, in eighths.
@@ -59,7 +61,8 @@ private:
 
     struct TwiceIntrinsic {
         int value;
-        bool isSure;  ///< whether the bit below an eighth, which dumps lack, follows from the dump's own values
+        bool isInferred;  ///< whether this bit is not that of the inputs, but of the values computed from it
+        bool isSure;      ///< whether the bit below an eighth, which dumps lack, follows from the dump's own values
     };
 
     TwiceIntrinsic twiceIntrinsic(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const;

@@ -40,14 +40,21 @@ template <class Use>
 auto withRule(int algorithm, Mistake mistake, Use use)
 {
     using Word = std::int16_t;
-    const Corrections<Word> table{corrections(), shiftOf(mistake)};
+    const Corrections<Word> table{corrections(), shiftOf(mistake), mistake != Mistake::correctedByMagnitude};
     const bool isCorrected = algorithm == 2 && mistake != Mistake::uncorrected;
     if (isCorrected && mistake == Mistake::correctedAtOnce) {
         return use(rules::DecideMaxStar<Word, Corrections<Word>>(table), Word());
     }
-    return mistake == Mistake::unwrapped ? withRuleOver(isCorrected, Corrections<Held>{corrections()}, use)
-           : mistake == Mistake::lesser  ? withRuleOver(isCorrected, Corrections<Leaf>{corrections()}, use)
-                                         : withRuleOver(isCorrected, table, use);
+    switch (mistake.kind) {
+    case Mistake::unwrapped:
+        return withRuleOver(isCorrected, Corrections<Held>{corrections()}, use);
+    case Mistake::comparedPlainly:
+        return withRuleOver(isCorrected, Corrections<Plain>{corrections()}, use);
+    case Mistake::lesser:
+        return withRuleOver(isCorrected, Corrections<Leaf>{corrections()}, use);
+    default:
+        return withRuleOver(isCorrected, table, use);
+    }
 }
 
 template <class Decision, class Value>
@@ -329,7 +336,9 @@ Replay::Metrics Replay::backwardStart(
     if (cut.startsAtTail(window)) {
         return border(tail(pass, mistake), mistake);
     }
-    const auto left = borderPass(pass, cut.startsFromThisPass(window), mistake);
+    // A window's own last column is not there before the next pass.
+    const bool isOwn = mistake == Mistake::borderOfWindow && mistake.number < 0;
+    const auto left = borderPass(pass, cut.startsFromThisPass(window) && !isOwn, mistake);
     if (!left) {
         return {};
     }
@@ -372,10 +381,11 @@ Column Replay::ratioColumn(unsigned pass, unsigned trellisStep, Mistake mistake)
             return rules::subWrap(bestWord<1>(rule, forward, backward, branches, node),
                                   bestWord<0>(rule, forward, backward, branches, node));
         } else {
-            return mistake == Mistake::ratioHeld ? held(wordOf(rules::bestPath<1>(rule, forward, backward, branches)) -
-                                                        wordOf(rules::bestPath<0>(rule, forward, backward, branches)))
-                                                       .value
-                                                 : wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
+            const int one = wordOf(rules::bestPath<1>(rule, forward, backward, branches));
+            const int zero = wordOf(rules::bestPath<0>(rule, forward, backward, branches));
+            const bool isHeld = mistake == Mistake::ratioHeld;
+            return isHeld ? rules::wrap16(clippedTo(one - zero, mistake.number))
+                          : wordOf(rules::logLikelihoodRatio(rule, forward, backward, branches));
         }
     };
     const std::int16_t word = withRule(itsModel.generics.C_ALGORITHM_TYPE, mistake, ratio);

@@ -154,7 +154,8 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
     itsFirst = fewest->place.step;
     itsLast = most->place.step;
     itsIsOnePlace = faults.size() == 1;
-    if (itsKind == nullptr && model.cut.segments() > 1) {
+    constexpr std::size_t fewestOfKind = 8;  // a column
+    if (itsKind == nullptr ? model.cut.segments() > 1 : faults.size() >= fewestOfKind && isInSegments()) {
         itsSegment = common(faults, [&](const Place& place) { return model.cut.placeOf(place.step).segment; });
         itsUnit = common(faults, [&](const Place& place) { return model.cut.placeOf(place.step).unit; });
     }
@@ -175,6 +176,18 @@ Where::Where(const Model& model, const Comparison& comparison, const std::vector
     if (inDump == 1 || 2 * itsSignals.count() > static_cast<std::size_t>(inDump)) {
         itsSignals.set();
     }
+}
+
+bool Where::isInSegments() const
+{
+    const rules::Cut& cut = itsModel->cut;
+    std::set<unsigned> segments;
+    for (unsigned step = 0; step < cut.K() && segments.size() < 2; ++step) {
+        if (itsKind->matches(cut, {0, signalsOf(itsStage).first, step})) {
+            segments.insert(cut.placeOf(step).segment);
+        }
+    }
+    return segments.size() > 1;
 }
 
 unsigned Where::stepsAround() const

@@ -49,6 +49,8 @@ public:
     Where spread() const;
 
 private:
+    /// Whether several segments have places of the kind.
+    bool isInSegments() const;
     unsigned stepsAround() const;
     std::string passText() const;
     std::string signalText() const;

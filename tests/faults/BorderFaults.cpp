@@ -220,6 +220,15 @@ class ForwardUnknown : public Borders {
     }
 };
 
+class ForwardUnknownInOneSegment : public Borders {
+    using Borders::Borders;
+
+    T8 forwardKept(const Place& place, const T8&, const T8& reached) override
+    {
+        return place.u == 3 ? T8{} : border(reached);
+    }
+};
+
 class ForwardStale : public Borders {
     using Borders::Borders;
 
@@ -435,6 +444,7 @@ const std::vector<Fault>& borderFaults()
         inDecoder<UnknownFirstState>("first_state_unknown"),
         inDecoder<ForwardBitsKept>("forward_bits_kept"),
         inDecoder<ForwardUnknown>("forward_border_unknown"),
+        inDecoder<ForwardUnknownInOneSegment>("forward_border_unknown_in_one"),
         inDecoder<ForwardStale>("forward_border_stale"),
         inDecoder<ForwardLate>("forward_border_late"),
         inDecoder<ForwardEarly>("forward_border_early"),

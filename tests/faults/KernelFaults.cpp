@@ -1,7 +1,10 @@
 // KernelFaults: wrong branch metrics, recursions and log-likelihood ratios.
 #include <algorithm>
 #include <array>
+#include <cstdint>
+#include <cstdlib>
 #include <utility>
+#include <vector>
 
 #include "Fault.h"
 #include "rules/Arithmetic.h"
@@ -134,6 +137,24 @@ public:
     }
 };
 
+/// The table of an algorithm that has one, read by the magnitude of a negative difference.
+class TableByMagnitude : public FaultyEngine {
+public:
+    explicit TableByMagnitude(const TCalculationEngineModBase& sound) : FaultyEngine(sound)
+    {
+        if (sound.itsAlphaLUT == nullptr) {
+            return;
+        }
+        for (int difference = INT16_MIN; difference <= INT16_MAX; ++difference) {
+            itsTable.push_back(sound.itsAlphaLUT[std::min(std::abs(difference), INT16_MAX)]);
+        }
+        itsAlphaLUT = itsBetaLUT = itsLLRLUT = itsTable.data() - INT16_MIN;
+    }
+
+private:
+    std::vector<unsigned char> itsTable;
+};
+
 /// Each column is altered as soon as it is computed, and the next one is computed from it. It suits max-log-MAP, of
 /// whose decisions nothing is pending from one step to the next.
 class AlteredColumns : public FaultyEngine {
@@ -239,7 +260,7 @@ class RoundedRatios : public FaultyEngine {
     }
 };
 
-/// A metric in other arithmetic than that of 16 bits which wrap: Sum gives the sum's value.
+/// A metric in other arithmetic than that of 16 bits which wrap: Sum gives the sum's value, and compares.
 template <class Sum>
 struct Metric {
     short value;
@@ -256,19 +277,41 @@ struct Metric {
 
     friend constexpr Metric maxWrap(Metric a, Metric b)
     {
-        return subWrap(a, b).value < 0 ? b : a;
+        return Sum::isLess(a.value, b.value) ? b : a;
     }
 };
 
-struct Saturated {
+/// Compares by the sign of a difference.
+template <class Sum>
+struct ComparedBySign {
+    static constexpr bool isLess(int a, int b)
+    {
+        return Sum::of(a - b) < 0;
+    }
+};
+
+struct Saturated : ComparedBySign<Saturated> {
     static constexpr short of(int sum)
     {
         return wrap16(clip(sum, -32768, 32752));
     }
 };
 
+/// Metrics that wrap, but are compared as plain numbers.
+struct ComparedPlainly {
+    static constexpr short of(int sum)
+    {
+        return wrap16(sum);
+    }
+
+    static constexpr bool isLess(int a, int b)
+    {
+        return a < b;
+    }
+};
+
 template <int bits>
-struct Wrapped {
+struct Wrapped : ComparedBySign<Wrapped<bits>> {
     static constexpr short of(int sum)
     {
         constexpr int above = 1 << (12 - bits);
@@ -483,8 +526,9 @@ class RatioCellDead : public FaultyEngine {
     }
 };
 
-/// The last subtraction of a ratio is wider and saturates.
-class UnwrappedRatios : public FaultyEngine {
+/// The last subtraction of a ratio is wider, and is clipped to so many bits.
+template <int bits>
+class ClippedRatios : public FaultyEngine {
     using FaultyEngine::FaultyEngine;
 
     short* llr(unsigned n, const T8* a, const T8* b, const T8* g, short* out) override
@@ -499,7 +543,8 @@ class UnwrappedRatios : public FaultyEngine {
             const rules::BranchMetrics<short> of = {g[k][0], g[k][1], g[k][2], g[k][3]};
             const int one = rules::bestPath<1>(rule, column(a[k]), column(b[k]), of);
             const int zero = rules::bestPath<0>(rule, column(a[k]), column(b[k]), of);
-            out[k] = Saturated::of(one - zero);
+            constexpr int end = 16 << (bits - 1);
+            out[k] = wrap16(clip(one - zero, -end, end - 16));
         }
         return out + n;
     }
@@ -519,8 +564,10 @@ const std::vector<Fault>& kernelFaults()
         inEngine<IntrinsicDoubledInEight>("doubled_in_eight"),
         inEngine<BackwardUncorrected>("backward_uncorrected"),
         inEngine<ForwardCorrectedEarly>("forward_corrected_early"),
+        inEngine<TableByMagnitude>("table_by_magnitude"),
         inEngine<StatesSwapped>("forward_state_swapped"),
         inEngine<OtherMetrics<Saturated>>("metrics_unwrapped"),
+        inEngine<OtherMetrics<ComparedPlainly>>("metrics_compared_plainly"),
         inEngine<OtherMetrics<Wrapped<11>>>("metrics_eleven_bits"),
         inEngine<OtherRatios<Wrapped<7>>>("ratio_seven_bits"),
         inEngine<StoredInElevenBits>("metrics_stored_in_eleven_bits"),
@@ -537,7 +584,8 @@ const std::vector<Fault>& kernelFaults()
         inEngine<RatioCellDead>("ratio_cell_dead"),
         inEngine<NegatedRatios>("ratio_sign"),
         inEngine<RoundedRatios>("ratio_rounding"),
-        inEngine<UnwrappedRatios>("ratio_unwrapped"),
+        inEngine<ClippedRatios<12>>("ratio_unwrapped"),
+        inEngine<ClippedRatios<9>>("ratio_clipped_to_nine_bits"),
     };
     return faults;
 }

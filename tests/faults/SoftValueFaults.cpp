@@ -231,6 +231,7 @@ class MisreadApriori : public AlteredApriori {
         itsInterleaver->calcDeinterleaver(natural, K());
         itsInterleaver->calcInterleaver(interleaved, K());
         const bool first = constituent(h) == 0;
+        itsIsNatural = first;
         const Order& order = first ? natural : interleaved;
         const Order& other = first ? interleaved : natural;
         std::vector<short> moved = extrinsic;
@@ -241,6 +242,15 @@ class MisreadApriori : public AlteredApriori {
     }
 
     virtual unsigned place(unsigned j, const Order& order, const Order& other) const = 0;
+
+    bool itsIsNatural = false;
+
+protected:
+    /// Whether the pass is over the first code.
+    bool isNatural() const
+    {
+        return itsIsNatural;
+    }
 };
 
 class UnpermutedApriori : public MisreadApriori {
@@ -285,6 +295,17 @@ class AprioriAddressBit : public MisreadApriori {
     unsigned place(unsigned j, const std::vector<unsigned>& order, const std::vector<unsigned>&) const override
     {
         return order[j] & ~8U;
+    }
+};
+
+/// The same in a memory whose addresses are the bits of the block, in both passes.
+class AprioriAddressBitInOrder : public MisreadApriori {
+    using MisreadApriori::MisreadApriori;
+
+    unsigned place(unsigned j, const std::vector<unsigned>& order, const std::vector<unsigned>&) const override
+    {
+        // The first code is decoded in the order of the bits, and reads what the second one has left.
+        return isNatural() ? order[j & ~8U] : order[j] & ~8U;
     }
 };
 
@@ -356,6 +377,19 @@ class IntrinsicNotHalved : public FaultyDecoder {
         for (short& value : itsIntrinsic) {
             value = wrap16(2 * value);
         }
+        return computed;
+    }
+};
+
+/// The bit below an eighth, which dumps do not show, is lost.
+class IntrinsicCut : public FaultyDecoder {
+    using FaultyDecoder::FaultyDecoder;
+
+    bool calcIntrinsic(unsigned int h) override
+    {
+        const bool computed = FaultyDecoder::calcIntrinsic(h);
+        std::for_each(
+            itsIntrinsic.begin(), itsIntrinsic.begin() + K(), [](short& value) { value = wrap16(value & ~8); });
         return computed;
     }
 };
@@ -570,11 +604,13 @@ const std::vector<Fault>& softValueFaults()
         inDecoder<AprioriOfCellBefore>("apriori_cell_before"),
         inDecoder<AprioriAddressBit>("apriori_address_bit"),
         inDecoder<AprioriCellsDead>("apriori_cells_dead"),
+        inDecoder<AprioriAddressBitInOrder>("apriori_address_bit_in_order"),
         inDecoder<AprioriAddressHeld>("apriori_address_held"),
         inDecoder<AprioriCellStuck>("apriori_cell_stuck"),
         inDecoder<WeightedApriori<1>>("apriori_whole"),
         inDecoder<WeightedApriori<-1>>("apriori_quartered"),
         inDecoder<IntrinsicNotHalved>("intrinsic_not_halved"),
+        inDecoder<IntrinsicCut>("intrinsic_cut"),
         inDecoder<BranchAprioriWhole>("branch_apriori_whole"),
         inDecoder<ExtrinsicAprioriMissing>("extrinsic_apriori_missing"),
         inDecoder<RatioAprioriWhole>("ratio_apriori_whole"),

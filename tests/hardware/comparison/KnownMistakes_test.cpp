@@ -86,20 +86,19 @@ std::string textOf(const Finding& finding)
     return text + finding.shared + " " + finding.where + " " + std::to_string(finding.faults);
 }
 
-class Mistakes : public testing::TestWithParam<Stage> {};
-
-TEST_P(Mistakes, AreNamedUnlessARightValueContradictsThem)
+/// Expects each mistake of a stage that shows in a block to be named, and not where half of the values contradict it.
+void expectNamed(Stage stage, int algorithm)
 {
     constexpr std::size_t fewest = 12;
-    const Model model = modelOf(256, 1, 48);
+    const Model model = modelOf(256, algorithm, 48);
     blocks::Random random(7);
     std::size_t named = 0;
-    for (const KnownMistake& each : knownMistakes(model, GetParam())) {
-        const auto isWrong = [&](Stage stage) {
-            return stage == GetParam() || each.reach == Candidate::core;
+    for (const KnownMistake& each : knownMistakes(model, stage)) {
+        const auto isWrong = [&](Stage asked) {
+            return asked == stage || each.reach == Candidate::core;
         };
         const Values all = dumpWith(model, each.mistake, isWrong);
-        const auto found = findingIn(model, all, GetParam());
+        const auto found = findingIn(model, all, stage);
         if (!found || found->faults < fewest) {
             continue;
         }
@@ -108,14 +107,26 @@ TEST_P(Mistakes, AreNamedUnlessARightValueContradictsThem)
             ++named;
         }
         const Values some =
-            dumpWith(model, each.mistake, [&](Stage stage) { return isWrong(stage) && random() % 2 == 0; });
-        const auto half = findingIn(model, some, GetParam());
+            dumpWith(model, each.mistake, [&](Stage asked) { return isWrong(asked) && random() % 2 == 0; });
+        const auto half = findingIn(model, some, stage);
         if (half && half->faults < found->faults) {
             const bool isElsewhere = half->where != found->where;  // "in half-iteration 3 alone" is true then
             EXPECT_FALSE(names(*half, each.text) && !isElsewhere) << each.text << "\n" << textOf(*half);
         }
     }
     EXPECT_GE(named, 8U);
+}
+
+class Mistakes : public testing::TestWithParam<Stage> {};
+
+TEST_P(Mistakes, AreNamedUnlessARightValueContradictsThem)
+{
+    expectNamed(GetParam(), 1);
+}
+
+TEST_P(Mistakes, AreNamedInACoreWithATable)
+{
+    expectNamed(GetParam(), 2);
 }
 
 INSTANTIATE_TEST_SUITE_P(Stages, Mistakes, testing::ValuesIn(morvik::stages), [](const auto& each) {
@@ -176,6 +187,35 @@ TEST(FittedMistakes, TakeTheSimplestFactorThatFits)
                                                                 : "the factor is 0.515625, not 0.75 (rule 14)"};
         EXPECT_EQ(found->how, expected);
     }
+}
+
+TEST(FittedMistakes, TellAConstant)
+{
+    const Model model = modelOf(256, 1, 16);
+    const unsigned ratio = morvik::signalsOf(Stage::ratio).first;
+    for (const int offset : {-3, 5}) {
+        Values dump = model.values;
+        for (unsigned step = 0; step < model.cut.K(); ++step) {
+            dump.set({3, ratio, step}, static_cast<std::int16_t>(model.values.at({3, ratio, step}) + offset));
+        }
+        const auto found = findingIn(model, dump, Stage::ratio);
+        ASSERT_TRUE(found);
+        const std::vector<std::string> expected = {"a constant of " + std::to_string(offset) + " is added"};
+        EXPECT_EQ(found->how, expected);
+    }
+}
+
+TEST(KnownMistakes, TakeAWindowsOwnColumnFromThePassBefore)
+{
+    // Three windows in each segment, so that the last one starts from a column of the same pass.
+    const Model model = modelOf(1088, 1, 16);
+    ASSERT_EQ(model.cut.rows(), 3U);
+    const Values dump =
+        dumpWith(model, {Mistake::borderOfWindow, -1}, [](Stage stage) { return stage == Stage::backward; });
+    const auto found = findingIn(model, dump, Stage::backward);
+    ASSERT_TRUE(found);
+    EXPECT_TRUE(names(*found, "border metrics are those of the window before the right one (rule 20)"))
+        << textOf(*found);
 }
 
 TEST(FittedMistakes, TellTheRangeOfAnAddress)
