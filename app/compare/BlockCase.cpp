@@ -40,6 +40,12 @@ std::vector<std::string> otherRunsOf(const BlockCase& block,
                                                                           : std::vector<std::string>();
 }
 
+coverage::CoreCounts situationsOf(const comparison::Model& model, const comparison::Values& values)
+{
+    return coverage::countsAt(
+        model, [&](const comparison::Place& place) { return values.at(place) == model.values.at(place); });
+}
+
 }  // namespace
 
 std::uint32_t BlockCase::K() const
@@ -94,6 +100,9 @@ CaseResult compareCase(const BlockCase& block,
         {found, coverage, model, dump, dumpName, options.partial, otherRunsOf(block, found, dump.values)});
     result.report = std::move(report.text);
     result.findings = std::move(report.findings);
+    if (options.countsSituations()) {
+        result.situations = situationsOf(model, dump.values);
+    }
     return result;
 }
 

@@ -2,6 +2,7 @@
 #ifndef MORVIK_APP_COMPARE_BLOCKCASE_H
 #define MORVIK_APP_COMPARE_BLOCKCASE_H
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -9,6 +10,7 @@
 #include "OtherRuns.h"
 #include "hardware/comparison/Comparison.h"
 #include "hardware/comparison/Dump.h"
+#include "hardware/coverage/Counts.h"
 
 namespace morvik {
 
@@ -37,6 +39,9 @@ struct CaseResult {
     std::string report;   ///< in many; the reason if the dump is unreadable
     std::vector<std::string> findings;
     std::string warnings;  ///< of the model
+
+    /// The situations of the arithmetic at values of the dump that are right, if they are counted.
+    std::optional<coverage::CoreCounts> situations;
 };
 
 /// A dump without values for the block.

@@ -37,10 +37,12 @@ void expectOwnResults(const CompareOptions& options)
 {
     const std::vector<std::string> inputs = {options.block, options.dump, options.map};
     base::expectOwnFile(base::standardStream, inputs, "reports");
-    for (const std::string& output : {options.json, options.junit}) {
+    for (const std::string& output : options.outputs()) {
         base::expectOwnFile(output, inputs, "results");
     }
     base::expectDistinct(options.json, options.junit);
+    base::expectDistinct(options.json, options.coverage);
+    base::expectDistinct(options.junit, options.coverage);
 }
 
 ComparedSet compareBlock(const CompareOptions& options, const comparison::NameMap& map)
@@ -140,7 +142,13 @@ int compare(const CLI::App& command, const CompareOptions& options)
     if (!options.junit.empty()) {
         base::writeFile(options.junit, junitText(sets));
     }
-    print(textOf(sets));
+    std::string text = textOf(sets);
+    if (!options.coverage.empty()) {
+        const coverage::Counts counts = situationsOf(sets);
+        base::writeFile(options.coverage, coverage::textOf(counts));
+        text += "\nsituations: " + coverage::summary(counts) + '\n';
+    }
+    print(text);
     return statusOf(sets);
 }
 
@@ -201,6 +209,12 @@ void addResultOptions(CLI::App& command, CompareOptions& options)
 {
     command.add_option("--json", options.json, "Write all results to this file, as JSON")->type_name("FILE");
     command.add_option("--junit", options.junit, "Write all results to this file, for CI servers")->type_name("FILE");
+    command
+        .add_option(
+            "--coverage",
+            options.coverage,
+            "Write how often right values of the dumps meet each situation of the arithmetic to this file, as CSV")
+        ->type_name("FILE");
     command.add_option("--threads", options.threads, "Threads that compare blocks of a set; default: as many as cores")
         ->transform(integerFrom(1, 1024))
         ->type_name("N");

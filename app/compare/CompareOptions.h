@@ -21,10 +21,24 @@ struct CompareOptions {
     std::string form;
     std::string json;
     std::string junit;
+    std::string coverage;
     std::uint32_t threads = 0;  ///< 0: as many as cores
     bool ignoreUnknown = false;
     bool partial = false;
     bool suggestMap = false;
+
+    /// Whether the situations of the arithmetic are counted.
+    bool countsSituations() const
+    {
+        return !coverage.empty() || !json.empty();
+    }
+
+    /// The files of the results.
+    std::vector<std::string> outputs() const
+    {
+        return {json, junit, coverage};
+    }
+
     DecoderOptions decoder;
 };
 

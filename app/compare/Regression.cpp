@@ -232,7 +232,7 @@ std::vector<ComparedSet> readSets(const CompareOptions& options)
     std::vector<ComparedSet> sets;
     for (const std::string& folder : options.sets) {
         const ComparedSet& set = sets.emplace_back(readSet(folder));
-        for (const std::string& output : {options.json, options.junit}) {
+        for (const std::string& output : options.outputs()) {
             base::expectOwnFile(output, set.files, "results");
             base::expectOwnFile(output, dumpsOf(set, options), "results");
         }
@@ -254,6 +254,19 @@ void keepSelected(ComparedSet& set, const CompareOptions& options)
 }
 
 }  // namespace
+
+coverage::Counts situationsOf(const std::vector<ComparedSet>& sets)
+{
+    coverage::Counts counts;
+    for (const ComparedSet& set : sets) {
+        for (const CaseResult& result : set.results) {
+            if (result.situations) {
+                counts.add(*result.situations);
+            }
+        }
+    }
+    return counts;
+}
 
 std::vector<ComparedSet> compareSets(const CompareOptions& options, const comparison::NameMap& map)
 {

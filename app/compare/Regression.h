@@ -19,6 +19,9 @@ struct ComparedSet {
     std::vector<CaseResult> results;  ///< of the cases, in their order
 };
 
+/// The sums of what the dumps of the sets have met, if it was counted.
+coverage::Counts situationsOf(const std::vector<ComparedSet>& sets);
+
 /// Compares the dumps of each set's blocks, in several threads. What cannot be read is a result. Throws base::Error if
 /// a set itself cannot be read.
 std::vector<ComparedSet> compareSets(const CompareOptions& options, const comparison::NameMap& map);

@@ -9,6 +9,7 @@
 #include "base/Json.h"
 #include "base/Printable.h"
 #include "base/Text.h"
+#include "coverage/CountsJson.h"
 
 namespace morvik {
 
@@ -253,6 +254,9 @@ std::string summaryText(const std::vector<ComparedSet>& sets)
     if (countOf(sets, Verdict::different) > 0) {
         text += '\n' + signalTable(sets) + '\n';
     }
+    if (countOf(sets, Verdict::incomplete) > 0) {
+        text += "Incomplete: values of their signals are missing. Use --partial if that is intended.\n";
+    }
     for (const auto& [mistake, blocks] : mistakesOf(sets)) {
         text += "in " + base::counted(blocks, "block") + ": " + mistake + '\n';
     }
@@ -284,6 +288,7 @@ std::string jsonText(const std::vector<ComparedSet>& sets)
     for (const auto& [mistake, blocks] : mistakesOf(sets)) {
         summary["mistakes"].push_back({{"mistake", mistake}, {"blocks", blocks}});
     }
+    summary["coverage"] = countsJson(situationsOf(sets));
     constexpr int indentation = 2;
     return json.dump(indentation, ' ', false, Json::error_handler_t::replace) + '\n';
 }

@@ -4,10 +4,11 @@
 #include <filesystem>
 #include <map>
 #include <memory>
-#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
+#include "CountsJson.h"
+#include "Lists.h"
 #include "Notice.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
@@ -29,6 +30,7 @@ struct Options {
     std::string report;
     bool all = false;
     bool json = false;
+    bool missing = false;
     bool list = false;
 };
 
@@ -61,6 +63,11 @@ std::string listText()
         text += lineOf(each, "");
     }
     return text;
+}
+
+std::string missingText(const coverage::Counts& counts)
+{
+    return listed(counts.missing(), [](unsigned number) { return coverage::situations()[number].name; }) + '\n';
 }
 
 /// How many situations cannot be met for each reason.
@@ -99,25 +106,8 @@ std::string textOf(const coverage::Counts& counts, bool all)
 
 std::string jsonOf(const coverage::Counts& counts)
 {
-    using Json = nlohmann::ordered_json;
-    Json cores = Json::array();
-    for (const coverage::CoreCounts& each : counts.cores()) {
-        cores.push_back({{"num_pu", each.core.units},
-                         {"algorithm", rules::algorithmNames.at(each.core.algorithm)},
-                         {"blocks", each.blocks}});
-    }
-    Json situations = Json::array();
-    for (unsigned number = 0; number < coverage::situations().size(); ++number) {
-        const coverage::Situation& each = coverage::situations()[number];
-        const auto why = counts.whyImpossible(number);
-        situations.push_back(
-            {{"name", each.name}, {"rule", each.rule}, {"text", each.text}, {"count", counts.met(number)}});
-        situations.back()["impossible"] = why ? Json(*why) : Json();
-    }
-    const Json object = {{"version", MORVIK_VERSION},
-                         {"cores", cores},
-                         {"missing", counts.missing().size()},
-                         {"situations", situations}};
+    nlohmann::ordered_json object = {{"version", MORVIK_VERSION}};
+    object.update(countsJson(counts));
     return object.dump(2) + '\n';
 }
 
@@ -166,7 +156,7 @@ int run(const Options& options)
 {
     if (options.list) {
         if (!options.inputs.empty() || !options.output.empty() || !options.report.empty() || options.all ||
-            options.json) {
+            options.json || options.missing) {
             throw base::Error("--list prints all situations, and takes nothing else; see 'morvik coverage --help'");
         }
         print(listText());
@@ -191,7 +181,9 @@ int run(const Options& options)
     if (!options.report.empty()) {
         writePage(options.report, counts);
     }
-    print(options.json ? jsonOf(counts) : textOf(counts, options.all));
+    print(options.json      ? jsonOf(counts)
+          : options.missing ? missingText(counts)
+                            : textOf(counts, options.all));
     return counts.missing().empty() ? success : differencesFound;
 }
 
@@ -217,8 +209,13 @@ Command addCoverage(CLI::App& app)
     command->add_option("FILE", options->inputs, "Counts, or folders of vectors")->type_name("");
     command->add_option("--output", options->output, "Write the sums to this file, as CSV")->type_name("FILE");
     command->add_option("--report", options->report, "Draw the sums as an HTML page")->type_name("FILE");
-    command->add_flag("--all", options->all, "Print the situations that have been met, too");
-    command->add_flag("--json", options->json, "Print a JSON object instead of text");
+    CLI::Option* const all = command->add_flag("--all", options->all, "Print the situations that have been met, too");
+    CLI::Option* const json = command->add_flag("--json", options->json, "Print a JSON object instead of text");
+    command
+        ->add_flag("--missing",
+                   options->missing,
+                   "Print the names of missing situations alone, as --cover of 'morvik vectors' takes them")
+        ->excludes(all, json);
     command->add_flag("--list", options->list, "Print all situations, and what they are, instead");
     command->footer(explanation);
     const auto work = [options] {

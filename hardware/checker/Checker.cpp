@@ -13,35 +13,9 @@
 #include "hardware/comparison/Dump.h"
 #include "hardware/comparison/NameMap.h"
 #include "hardware/comparison/Report.h"
-#include "hardware/coverage/Meetings.h"
 #include "hardware/testbench/Decoder.h"
 
 namespace morvik::checker {
-
-namespace {
-
-/// Counts the situations at values that a predicate accepts.
-template <class IsTaken>
-class ObservedCounter : public coverage::Taker {
-public:
-    ObservedCounter(coverage::CoreCounts& counts, IsTaken isTaken) : itsCounts(counts), itsIsTaken(isTaken) {}
-
-    void atValue(unsigned situation, const Place& place) override
-    {
-        itsCounts.met[situation] += itsIsTaken(place) ? 1U : 0U;
-    }
-
-    void ofBlock(unsigned situation) override
-    {
-        ++itsCounts.met[situation];
-    }
-
-private:
-    coverage::CoreCounts& itsCounts;
-    IsTaken itsIsTaken;
-};
-
-}  // namespace
 
 Checker::Checker(const veltra_ip_morvik_v1_0_generics& generics) : itsGenerics(generics)
 {
@@ -153,12 +127,7 @@ coverage::Counts Checker::situations() const
     coverage::Counts sum = *itsSituations;
     const std::uint64_t observed = std::accumulate(itsCounts.begin(), itsCounts.end(), std::uint64_t{0});
     if (observed > itsDifferences) {
-        coverage::CoreCounts counts;
-        counts.core = coverage::coreOf(itsGenerics);
-        counts.blocks = 1;
-        ObservedCounter counter(counts, [this](const Place& place) { return isRight(place); });
-        coverage::findSituations(*itsModel, counter);
-        sum.add(counts);
+        sum.add(coverage::countsAt(*itsModel, [this](const Place& place) { return isRight(place); }));
     }
     return sum;
 }

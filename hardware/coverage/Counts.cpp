@@ -19,24 +19,6 @@ constexpr char header[] = "num_pu,algorithm,situation,count";
 /// Stands among the situations for the number of blocks.
 constexpr char blocksName[] = "blocks";
 
-class Counter : public Taker {
-public:
-    explicit Counter(CoreCounts& counts) : itsCounts(counts) {}
-
-    void atValue(unsigned situation, const comparison::Place&) override
-    {
-        ++itsCounts.met[situation];
-    }
-
-    void ofBlock(unsigned situation) override
-    {
-        ++itsCounts.met[situation];
-    }
-
-private:
-    CoreCounts& itsCounts;
-};
-
 /// Reads the lines of one core after the other.
 class Reader {
 public:
@@ -127,12 +109,7 @@ private:
 
 CoreCounts countsOf(const comparison::Model& model)
 {
-    CoreCounts counts;
-    counts.core = coreOf(model.generics);
-    counts.blocks = 1;
-    Counter counter(counts);
-    findSituations(model, counter);
-    return counts;
+    return countsAt(model, [](const comparison::Place&) { return true; });
 }
 
 void Counts::add(const CoreCounts& counts)

@@ -20,6 +20,34 @@ struct CoreCounts {
     std::vector<std::uint64_t> met = std::vector<std::uint64_t>(situations().size());
 };
 
+/// The counts of a block at the values that a predicate of their places accepts.
+template <class IsTaken>
+CoreCounts countsAt(const comparison::Model& model, IsTaken isTaken)
+{
+    struct Counter : Taker {
+        Counter(CoreCounts& sums, IsTaken predicate) : counts(sums), isTaken(predicate) {}
+
+        void atValue(unsigned situation, const comparison::Place& place) override
+        {
+            counts.met[situation] += isTaken(place) ? 1U : 0U;
+        }
+
+        void ofBlock(unsigned situation) override
+        {
+            ++counts.met[situation];
+        }
+
+        CoreCounts& counts;
+        IsTaken isTaken;
+    };
+    CoreCounts counts;
+    counts.core = coreOf(model.generics);
+    counts.blocks = 1;
+    Counter counter(counts, isTaken);
+    findSituations(model, counter);
+    return counts;
+}
+
 /// The counts of a block whose values are all computed.
 CoreCounts countsOf(const comparison::Model& model);
 

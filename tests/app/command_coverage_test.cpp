@@ -122,15 +122,19 @@ TEST_F(Coverage, IsSummedOverFilesAndFolders)
     const auto sum = jsonOf({"sum.csv"});
     EXPECT_EQ(sum["cores"][0]["blocks"], 2);
     unsigned missing = 0;
+    std::string names;
     for (std::size_t i = 0; i < sum["situations"].size(); ++i) {
         const auto& each = sum["situations"][i];
         const std::uint64_t count = each["count"];
         EXPECT_EQ(
             count,
             one["situations"][i]["count"].get<std::uint64_t>() + two["situations"][i]["count"].get<std::uint64_t>());
-        missing += count == 0 && each["impossible"].is_null() ? 1U : 0U;
+        if (count == 0 && each["impossible"].is_null()) {
+            names += (missing++ == 0 ? "" : ",") + each["name"].get<std::string>();
+        }
     }
     EXPECT_EQ(sum["missing"], missing);
+    EXPECT_EQ(run("coverage", {"sum.csv", "--missing"}).out, names + '\n');
 }
 
 TEST_F(Coverage, ListsAllSituations)

@@ -98,7 +98,7 @@ class Regression(unittest.TestCase):
 
     def test_one_command_names_the_broken_block(self):
         result = self.run_morvik("compare", "--set", *self.sets, "--dump", "{set}/rtl.csv", "--junit", "results.xml",
-                                 "--json", "results.json", status=1)
+                                 "--json", "results.json", "--coverage", "met.csv", status=1)
         self.expect_one_broken(junitparser.JUnitXml.fromfile(str(self.folder / "results.xml")), "4_scaled/rtl.csv")
         self.assertIn("4_scaled (4 units, scaled, 1 iteration), 22 blocks: 21 equal, 1 different\n"
                       "  block 7 (random, K = 40), 4_scaled/rtl.csv: different: 1 difference, 1 fault; "
@@ -114,9 +114,36 @@ class Regression(unittest.TestCase):
         self.assertEqual(summary["mistakes"], [{"mistake": MISTAKE, "blocks": 1}])
         self.assertEqual([(each["signal"], each["differences"], each["blocks"]) for each in summary["signals"]
                           if each["differences"]], [("extrinsic", 1, 1)])
+        self.assertEqual(sum(core["blocks"] for core in summary["coverage"]["cores"]), 200)
+        self.assertEqual(json.loads(self.run_morvik("coverage", "met.csv", "--json", status=1).stdout)["situations"],
+                         summary["coverage"]["situations"])
+        self.assertRegex(result.stdout, r"\nsituations: \d+ of \d+ met; missing: ")
         block = results["sets"][4]["blocks"][7]
         self.assertEqual(block["first"], {"half_iteration": 1, "step": 5, "signal": "extrinsic"})
         self.assertEqual(block["result"], "different")
+
+    def test_a_right_dump_meets_what_its_set_meets(self):
+        self.run_morvik("vectors", "--out", "right", "--block-size", "40,136", "--blocks", 2, "--iterations", 2,
+                        "--algorithm", "table", "--no-directed", "--internal", "--format", "csv", "--coverage", "set.csv")
+        self.run_morvik("compare", "--set", "right", "--dump", "right/internal.csv", "--coverage", "dump.csv")
+        self.assertEqual((self.folder / "dump.csv").read_text(), (self.folder / "set.csv").read_text())
+        # Ratios alone meet no wrap of a metric, and wrong ratios nothing.
+        rows = rows_of(self.folder / "right/internal.csv")
+        places = [0, 1, 2, rows[0].index("llr")]
+        for name, wrong in (("ratios", 0), ("wrong", 1)):
+            with (self.folder / f"{name}.csv").open("w") as file:
+                csv.writer(file).writerows([[row[i] for i in places[:3]] + [str(int(row[places[3]]) ^ wrong)
+                                                                          if row is not rows[0] else "llr"]
+                                            for row in rows])
+            self.run_morvik("compare", "--set", "right", "--dump", f"{name}.csv", "--coverage", f"{name}_met.csv",
+                            status=wrong)
+        counts = {name: dict(row[2:] for row in rows_of(self.folder / f"{name}.csv"))
+                  for name in ("set", "ratios_met", "wrong_met")}
+        self.assertEqual(counts["ratios_met"]["wrap.ratio.one.above"], counts["set"]["wrap.ratio.one.above"])
+        self.assertEqual(counts["ratios_met"]["tie.ratio.one.last"], counts["set"]["tie.ratio.one.last"])
+        self.assertEqual(counts["ratios_met"]["tie.forward.3"], "0")
+        self.assertGreater(int(counts["set"]["tie.forward.3"]), 0)
+        self.assertEqual(counts["wrong_met"]["pass.first.natural"], "0")
 
     def test_results_do_not_depend_on_threads(self):
         results = [self.run_morvik("compare", "--set", *self.sets, "--dump", "{set}/rtl.csv", "--threads", threads,
@@ -145,6 +172,7 @@ class Regression(unittest.TestCase):
         (self.folder / "early.csv").write_text("".join(lines[:1 + 2 * 86 + 5]))
         result = self.run_morvik("compare", "--set", "2_scaled", "--dump", "early.csv", status=2)
         self.assertIn("23 blocks: 2 equal, 1 incomplete, 20 unreadable\n", result.stdout)
+        self.assertTrue(result.stdout.endswith("Use --partial if that is intended.\n"), result.stdout)
         (self.folder / "early.csv").write_text("".join(lines[:1 + 2 * 86 + 5]) + "0,1,1,1\n")
         result = self.run_morvik("compare", "--set", "2_scaled", "--dump", "early.csv", status=2)
         self.assertIn("23 blocks: 1 equal, 22 unreadable\n", result.stdout)
@@ -183,7 +211,7 @@ class Regression(unittest.TestCase):
         folder = self.folder / "2_scaled"
         (folder / "rtl_1.csv").write_text((folder / "rtl.csv").read_text())
         arguments = ("compare", "--set", "2_scaled", "--dump")
-        for option in ("--json", "--junit"):
+        for option in ("--json", "--junit", "--coverage"):
             for dump, name in (("{set}/rtl.csv", "rtl.csv"), ("{set}/rtl_{block}.csv", "rtl_1.csv"),
                                ("{set}/rtl.csv", "stimulus.csv"), ("{set}/rtl.csv", "manifest.json")):
                 before = (folder / name).read_bytes()
