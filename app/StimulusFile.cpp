@@ -7,6 +7,7 @@
 
 #include "SoftValueReader.h"
 #include "base/Error.h"
+#include "base/Path.h"
 #include "hardware/vectors/Manifest.h"
 #include "hardware/vectors/SetFolder.h"
 
@@ -66,16 +67,18 @@ struct SetName {
 SetName setNameOf(const std::string& name)
 {
     std::error_code ignored;
-    if (fs::is_directory(name, ignored) && fs::exists(fs::path(name) / vectors::manifestName, ignored)) {
+    if (fs::is_directory(base::pathOf(name), ignored) &&
+        fs::exists(base::pathOf(name) / vectors::manifestName, ignored)) {
         return {name, ""};
     }
-    const std::string ending = fs::path(name).extension().string();
+    const std::string ending = base::pathOf(name).extension().u8string();
     const std::string format = ending.empty() ? "" : ending.substr(1);
-    const std::string folder = fs::path(name).parent_path().string();
+    const std::string folder = base::pathOf(name).parent_path().u8string();
     const SetName set = {folder.empty() ? "." : folder, format};
     const bool isOther = format != "csv" && tables::findFormat(format) != nullptr;
-    return isOther && fs::exists(fs::path(set.folder) / vectors::manifestName, ignored) ? set
-                                                                                        : SetName{folder, std::nullopt};
+    return isOther && fs::exists(base::pathOf(set.folder) / vectors::manifestName, ignored)
+               ? set
+               : SetName{folder, std::nullopt};
 }
 
 /// Reads the format, or the first one of the set if it is empty.

@@ -13,6 +13,7 @@
 #include "base/Error.h"
 #include "base/Json.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 #include "base/Printable.h"
 #include "base/Text.h"
 #include "hardware/tables/Table.h"
@@ -174,7 +175,7 @@ std::string summaryOf(units::Number unit, const UnitVectors& vectors, const Made
 void makeFolder(const std::string& folder)
 {
     std::error_code error;
-    std::filesystem::create_directories(folder, error);
+    std::filesystem::create_directories(base::pathOf(folder), error);
     if (error) {
         throw base::Error(folder + ": " + error.message());
     }

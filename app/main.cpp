@@ -3,11 +3,11 @@
 
 #include "CommandLine.h"
 #include "Programs.h"
-#include "base/StandardStreams.h"
+#include "base/System.h"
 
 int main(int argc, char** argv)
 {
-    morvik::base::prepareStandardStreams();
+    morvik::base::system::prepareProgram(argc, argv);
     std::ios::sync_with_stdio(false);  // a trace makes millions of small writes
 
     const morvik::Program program = morvik::morvikProgram();

@@ -8,7 +8,7 @@
 #include "CommandLine.h"
 #include "Programs.h"
 #include "base/Error.h"
-#include "base/StandardStreams.h"
+#include "base/System.h"
 #include "ber/BerOptions.h"
 #include "ber/Interruption.h"
 #include "simulation/MpiWorkers.h"
@@ -68,7 +68,7 @@ int runAsOtherRank(int argc, const char* const* argv)
 
 int main(int argc, char** argv)
 {
-    morvik::base::prepareStandardStreams();  // before MPI opens anything
+    morvik::base::system::prepareProgram(argc, argv);  // before MPI opens anything
     MpiWorld world;
     return world.rank() == 0 ? runAsRankZero(world, argc, argv) : runAsOtherRank(argc, argv);
 }

@@ -1,133 +1,55 @@
 // ChildProcess: runs other programs, without a shell.
 #include "ChildProcess.h"
 
-#include <fcntl.h>
-#include <spawn.h>
-#include <sys/mman.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
 #include <array>
 #include <cerrno>
-#include <csignal>
 #include <streambuf>
 #include <system_error>
 #include <utility>
 
-#include "Descriptor.h"
 #include "Printable.h"
+#include "System.h"
 
 namespace morvik::base {
 
 namespace {
 
-[[noreturn]] void fail(int error)
+Descriptor opened(Descriptor file)
 {
-    throw std::system_error(error, std::generic_category());
+    if (!file.isOpen()) {
+        throw std::system_error(errno, std::generic_category());
+    }
+    return file;
 }
 
-/// A file in memory. Unlike a pipe, it never fills up and blocks the program whose standard stream it is.
-class MemoryFile {
+/// A file without a name. Unlike a pipe, it never fills up and blocks the program whose standard stream it is.
+class StreamFile {
 public:
-    explicit MemoryFile(const std::string& content = {}) : itsDescriptor(memfd_create("stream", MFD_CLOEXEC))
+    explicit StreamFile(const std::string& content = {}) : itsFile(opened(system::temporaryFile()))
     {
-        const auto size = static_cast<ssize_t>(content.size());
-        if (itsDescriptor < 0 || write(itsDescriptor, content.data(), content.size()) != size ||
-            lseek(itsDescriptor, 0, SEEK_SET) != 0) {
-            fail(errno);
+        if (!itsFile.write(content) || !itsFile.rewind()) {
+            throw std::system_error(errno, std::generic_category());
         }
-    }
-
-    MemoryFile(const MemoryFile&) = delete;
-    MemoryFile& operator=(const MemoryFile&) = delete;
-
-    ~MemoryFile()
-    {
-        close(itsDescriptor);
     }
 
     int descriptor() const
     {
-        return itsDescriptor;
+        return itsFile.number();
     }
 
     std::string content() const
     {
         std::string text;
         std::array<char, 4096> piece{};
-        for (ssize_t count = 0; (count = pread(itsDescriptor, piece.data(), piece.size(), off_t(text.size()))) > 0;) {
+        for (std::int64_t count = 0; (count = itsFile.readAt(text.size(), piece.data(), piece.size())) > 0;) {
             text.append(piece.data(), static_cast<std::size_t>(count));
         }
         return text;
     }
 
 private:
-    int itsDescriptor;
+    Descriptor itsFile;
 };
-
-/// The descriptors that a program gets as its standard streams.
-class Streams {
-public:
-    explicit Streams(const std::array<int, 3>& descriptors)
-    {
-        posix_spawn_file_actions_init(&itsActions);
-        for (int stream = 0; stream < 3; ++stream) {
-            posix_spawn_file_actions_adddup2(&itsActions, descriptors.at(static_cast<std::size_t>(stream)), stream);
-        }
-    }
-
-    Streams(const Streams&) = delete;
-    Streams& operator=(const Streams&) = delete;
-
-    ~Streams()
-    {
-        posix_spawn_file_actions_destroy(&itsActions);
-    }
-
-    const posix_spawn_file_actions_t* actions() const
-    {
-        return &itsActions;
-    }
-
-private:
-    posix_spawn_file_actions_t itsActions{};
-};
-
-int waitFor(pid_t process)
-{
-    int status = 0;
-    while (waitpid(process, &status, 0) < 0) {
-        if (errno != EINTR) {
-            fail(errno);
-        }
-    }
-    return status;
-}
-
-/// Starts a program with these standard streams.
-pid_t start(const std::vector<std::string>& commandLine, const std::array<int, 3>& descriptors)
-{
-    std::vector<std::string> words = commandLine;
-    std::vector<char*> argv;
-    argv.reserve(words.size() + 1);
-    for (std::string& word : words) {
-        argv.push_back(word.data());
-    }
-    argv.push_back(nullptr);
-
-    const Streams streams(descriptors);
-    pid_t process = 0;
-    const int error = posix_spawnp(&process, argv[0], streams.actions(), nullptr, argv.data(), environ);
-    if (error != 0) {
-        fail(error);
-    }
-    return process;
-}
-
-bool isSuccess(int status)
-{
-    return WIFEXITED(status) && WEXITSTATUS(status) == 0;
-}
 
 /// Reads what comes out of a pipe.
 class PipeBuffer : public std::streambuf {
@@ -142,10 +64,7 @@ public:
 protected:
     int_type underflow() override
     {
-        ssize_t count = -1;
-        do {
-            count = read(itsPipe.number(), itsContent.data(), itsContent.size());
-        } while (count < 0 && errno == EINTR);
+        const std::int64_t count = itsPipe.read(itsContent.data(), itsContent.size());
         if (count <= 0) {
             itsIsAtEnd = count == 0;
             return traits_type::eof();
@@ -158,22 +77,6 @@ private:
     Descriptor itsPipe;
     std::array<char, 65536> itsContent{};
     bool itsIsAtEnd = false;
-};
-
-/// The ends of a pipe, which other programs do not inherit.
-struct Pipe {
-    Pipe()
-    {
-        std::array<int, 2> ends{};
-        if (pipe2(ends.data(), O_CLOEXEC) != 0) {
-            fail(errno);
-        }
-        out = Descriptor(ends[0]);
-        in = Descriptor(ends[1]);
-    }
-
-    Descriptor out{-1};
-    Descriptor in{-1};
 };
 
 }  // namespace
@@ -189,46 +92,37 @@ std::string Outcome::firstMessage() const
 
 Outcome runProgram(const std::vector<std::string>& commandLine, const std::string& input)
 {
-    const MemoryFile in(input);
-    const MemoryFile out;
-    const MemoryFile err;
-    const int status = waitFor(start(commandLine, {in.descriptor(), out.descriptor(), err.descriptor()}));
-    return {isSuccess(status), out.content(), err.content()};
+    const StreamFile in(input);
+    const StreamFile out;
+    const StreamFile err;
+    system::Process process(commandLine, {in.descriptor(), out.descriptor(), err.descriptor()});
+    const bool succeeded = process.wait();
+    return {succeeded, out.content(), err.content()};
 }
 
 class RunningProgram::Process {
 public:
-    explicit Process(const std::vector<std::string>& commandLine) : Process(commandLine, Pipe()) {}
-    Process(const Process&) = delete;
-    Process& operator=(const Process&) = delete;
-
-    ~Process()
-    {
-        if (itsNumber > 0) {
-            kill(itsNumber, SIGTERM);
-            waitpid(itsNumber, nullptr, 0);
-        }
-    }
+    explicit Process(const std::vector<std::string>& commandLine) : Process(commandLine, system::makePipe()) {}
 
     Outcome wait()
     {
-        const int status = waitFor(std::exchange(itsNumber, 0));
-        return {isSuccess(status), "", itsMessages.content()};
+        const bool succeeded = itsProcess.wait();
+        return {succeeded, "", itsMessages.content()};
     }
 
     PipeBuffer buffer;
     std::istream output{&buffer};
 
 private:
-    Process(const std::vector<std::string>& commandLine, Pipe pipe)
-        : buffer(std::move(pipe.out)),
-          itsNumber(start(commandLine, {itsInput.descriptor(), pipe.in.number(), itsMessages.descriptor()}))
+    Process(const std::vector<std::string>& commandLine, system::Pipe pipe)
+        : buffer(opened(std::move(pipe.out))),
+          itsProcess(commandLine, {itsInput.descriptor(), pipe.in.number(), itsMessages.descriptor()})
     {
     }
 
-    MemoryFile itsInput;
-    MemoryFile itsMessages;
-    pid_t itsNumber;
+    StreamFile itsInput;
+    StreamFile itsMessages;
+    system::Process itsProcess;
 };
 
 RunningProgram::RunningProgram(const std::vector<std::string>& commandLine)

@@ -2,18 +2,14 @@
 #ifndef MORVIK_BASE_DESCRIPTOR_H
 #define MORVIK_BASE_DESCRIPTOR_H
 
-#include <sys/file.h>
-#include <sys/stat.h>
-#include <unistd.h>
-
-#include <cerrno>
-#include <string>
+#include <cstddef>
+#include <cstdint>
 #include <string_view>
 #include <utility>
 
 namespace morvik::base {
 
-/// Owns an open file descriptor and closes it.
+/// Owns an open file descriptor and closes it. What fails sets errno.
 class Descriptor {
 public:
     explicit Descriptor(int number) : itsNumber(number) {}
@@ -25,12 +21,8 @@ public:
         return *this;
     }
 
-    ~Descriptor()
-    {
-        const int reason = errno;  // the caller may still report it
-        close(itsNumber);
-        errno = reason;
-    }
+    /// Keeps errno, which the caller may still report.
+    ~Descriptor();
 
     bool isOpen() const
     {
@@ -42,49 +34,26 @@ public:
         return itsNumber;
     }
 
-    bool write(std::string_view content) const
-    {
-        while (!content.empty()) {
-            const ssize_t written = ::write(itsNumber, content.data(), content.size());
-            if (written < 0 && errno != EINTR) {
-                return false;
-            }
-            content.remove_prefix(written > 0 ? static_cast<std::size_t>(written) : 0);
-        }
-        return true;
-    }
+    bool write(std::string_view content) const;
 
-    bool sync() const
-    {
-        return fsync(itsNumber) == 0 || errno == EINVAL;  // EINVAL: not supported by the file system
-    }
+    /// Writes at a place in the file.
+    bool writeAt(std::uint64_t place, std::string_view content) const;
 
-    bool allow(mode_t mode) const
-    {
-        return fchmod(itsNumber, mode) == 0;
-    }
+    /// Reads what is there, at most `size` bytes; 0 at the end, negative if it fails.
+    std::int64_t read(char* content, std::size_t size) const;
+
+    /// The same from a place in the file.
+    std::int64_t readAt(std::uint64_t place, char* content, std::size_t size) const;
+
+    /// Continues at the file's start.
+    bool rewind() const;
+
+    /// Writes to the disk what the system still holds; true, too, if the file system cannot.
+    bool sync() const;
 
     /// Locks the file for this process until it is closed or the process ends in any way; false if another process
     /// holds the lock. Always succeeds on file systems without locks.
-    bool lock() const
-    {
-        return flock(itsNumber, LOCK_EX | LOCK_NB) == 0 || errno != EWOULDBLOCK;
-    }
-
-    /// Whether `fileName` names this file.
-    bool isAt(const std::string& fileName) const
-    {
-        struct stat own = {};
-        struct stat named = {};
-        return fstat(itsNumber, &own) == 0 && stat(fileName.c_str(), &named) == 0 && own.st_dev == named.st_dev &&
-               own.st_ino == named.st_ino;
-    }
-
-    bool isEmpty() const
-    {
-        struct stat own = {};
-        return fstat(itsNumber, &own) == 0 && own.st_size == 0;
-    }
+    bool lock() const;
 
 private:
     int itsNumber;

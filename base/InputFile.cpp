@@ -4,12 +4,13 @@
 #include <iostream>
 
 #include "Error.h"
+#include "Path.h"
 
 namespace morvik::base {
 
 std::ifstream openFile(const std::string& name)
 {
-    std::ifstream file(name, std::ios::binary);
+    std::ifstream file(pathOf(name), std::ios::binary);
     if (!file) {
         throw fileError(name, "opened");
     }

@@ -1,10 +1,6 @@
 // OutputFile: writes files.
 #include "OutputFile.h"
 
-#include <fcntl.h>
-#include <sys/stat.h>
-#include <unistd.h>
-
 #include <atomic>
 #include <cerrno>
 #include <cstdio>
@@ -16,6 +12,8 @@
 
 #include "Error.h"
 #include "Numbers.h"
+#include "Path.h"
+#include "System.h"
 
 namespace morvik::base {
 
@@ -26,7 +24,8 @@ constexpr int mostLinks = 40;
 
 constexpr std::size_t bufferSize = 65536;
 
-constexpr mode_t permissions = S_IRWXU | S_IRWXG | S_IRWXO;
+/// Everybody may read and write a new file, as far as the user's mask allows.
+constexpr unsigned newPermissions = 0666;
 
 /// What a name resolves to through links: a path, existing or not, or an open descriptor of this process.
 struct Place {
@@ -48,15 +47,15 @@ std::optional<int> descriptorNamed(std::string_view path)
 Place placeOf(const std::string& name)
 {
     if (name == standardStream) {
-        return {{}, STDOUT_FILENO};
+        return {{}, system::standardOutput};
     }
-    std::filesystem::path path = name;
+    std::filesystem::path path = pathOf(name);
     for (int links = 0; links <= mostLinks; ++links) {
         std::error_code none;  // set if this is no link
-        const auto descriptor = descriptorNamed(path.string());
+        const auto descriptor = descriptorNamed(path.u8string());
         const std::filesystem::path next = descriptor ? path : std::filesystem::read_symlink(path, none);
         if (descriptor || none) {
-            return {path.string(), descriptor};
+            return {path.u8string(), descriptor};
         }
         path = path.parent_path() / next;
     }
@@ -66,21 +65,15 @@ Place placeOf(const std::string& name)
 
 std::string folderOf(const std::string& place)
 {
-    const std::filesystem::path folder = std::filesystem::path(place).parent_path();
-    return folder.empty() ? "." : folder.string();
+    const std::filesystem::path folder = pathOf(place).parent_path();
+    return folder.empty() ? "." : folder.u8string();
 }
 
 /// A name in the folder that nobody else is likely to use.
 std::string temporaryName(const std::string& folder)
 {
     static std::atomic<unsigned> count{0};
-    return folder + "/.morvik-" + std::to_string(getpid()) + '-' + std::to_string(count++);
-}
-
-/// The path of an open file of this process.
-std::string nameOf(const Descriptor& file)
-{
-    return "/proc/self/fd/" + std::to_string(file.number());
+    return folder + "/.morvik-" + std::to_string(system::processNumber()) + '-' + std::to_string(count++);
 }
 
 }  // namespace
@@ -88,22 +81,20 @@ std::string nameOf(const Descriptor& file)
 OutputFile::OutputFile(const std::string& name) : itsName(name == standardStream ? "<stdout>" : name), itsFile(-1)
 {
     const Place place = placeOf(name);
-    struct stat old = {};
     if (place.descriptor) {
         std::cout.flush();  // earlier output comes first
-        itsFile = Descriptor(fcntl(*place.descriptor, F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
-        itsIsStandardOutput = place.descriptor == STDOUT_FILENO;
-    } else if (stat(place.path.c_str(), &old) != 0) {
-        constexpr mode_t anybody = S_IRUSR | S_IWUSR | S_IRGRP | S_IWGRP | S_IROTH | S_IWOTH;
+        itsFile = system::duplicate(*place.descriptor);
+        itsIsStandardOutput = place.descriptor == system::standardOutput;
+    } else if (const auto old = system::statusOf(place.path); !old) {
         if (errno == ENOENT && !name.empty()) {
-            openNew(place.path, anybody);
+            openNew(place.path, newPermissions);
         }
-    } else if (!S_ISREG(old.st_mode)) {
-        itsFile = Descriptor(open(place.path.c_str(), O_WRONLY | O_NOCTTY | O_CLOEXEC));
-    } else if (access(place.path.c_str(), W_OK) == 0) {
-        openNew(place.path, old.st_mode & permissions);
+    } else if (!old->isRegular) {
+        itsFile = system::openDevice(place.path);
+    } else if (system::isWritable(place.path)) {
+        openNew(place.path, old->permissions);
         if (itsFile.isOpen()) {
-            itsFile.allow(old.st_mode & permissions);  // may fail on some file systems; open() grants no more
+            system::allow(itsFile, old->permissions);  // may fail on some file systems; the file grants no more
         }
     }
     if (!itsFile.isOpen()) {
@@ -115,7 +106,7 @@ OutputFile::~OutputFile()
 {
     if (itsFile.isOpen() && !itsTemporary.empty()) {
         const int reason = errno;
-        unlink(itsTemporary.c_str());
+        system::removeFile(itsTemporary);
         errno = reason;
     }
 }
@@ -150,7 +141,7 @@ void OutputFile::overwriteStart(std::string_view text)
         errno = ESPIPE;
         fail();
     }
-    if (pwrite(itsFile.number(), text.data(), text.size(), 0) != static_cast<ssize_t>(text.size())) {
+    if (!itsFile.writeAt(0, text)) {
         fail();
     }
 }
@@ -177,30 +168,29 @@ Descriptor OutputFile::commit()
 {
     writeOut(std::exchange(itsText, {}));
     if (isReplaced()) {
-        if ((itsIsSecured && !itsFile.sync()) || !nameNew() || rename(itsTemporary.c_str(), itsPlace.c_str()) != 0) {
+        if ((itsIsSecured && !itsFile.sync()) || !nameNew() || !system::replaceFile(itsFile, itsTemporary, itsPlace)) {
             fail();
         }
         itsTemporary.clear();
         if (itsIsSecured) {
-            Descriptor(open(folderOf(itsPlace).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC))
-                .sync();  // the new name, too
+            system::syncFolder(folderOf(itsPlace));  // the new name, too
         }
     }
     return std::move(itsFile);
 }
 
 /// Creates the file unnamed where supported, so that it vanishes with the process; elsewhere under a temporary name.
-void OutputFile::openNew(const std::string& place, mode_t mode)
+void OutputFile::openNew(const std::string& place, unsigned permissions)
 {
     itsPlace = place;
     const std::string folder = folderOf(itsPlace);
-    itsFile = Descriptor(open(folder.c_str(), O_TMPFILE | O_WRONLY | O_CLOEXEC, mode));
-    if (itsFile.isOpen() && access(nameOf(itsFile).c_str(), F_OK) == 0) {
+    itsFile = system::createUnnamed(folder, permissions);
+    if (itsFile.isOpen()) {
         return;
     }
     do {
         itsTemporary = temporaryName(folder);
-        itsFile = Descriptor(open(itsTemporary.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode));
+        itsFile = system::createFile(itsTemporary, permissions);
     } while (!itsFile.isOpen() && errno == EEXIST);
 }
 
@@ -210,16 +200,16 @@ bool OutputFile::nameNew()
     if (!itsTemporary.empty()) {
         return true;
     }
-    int failure = 0;
+    bool isNamed = false;
     std::string name;
     do {
         name = temporaryName(folderOf(itsPlace));
-        failure = linkat(AT_FDCWD, nameOf(itsFile).c_str(), AT_FDCWD, name.c_str(), AT_SYMLINK_FOLLOW);
-    } while (failure != 0 && errno == EEXIST);
-    if (failure == 0) {
+        isNamed = system::nameFile(itsFile, name);
+    } while (!isNamed && errno == EEXIST);
+    if (isNamed) {
         itsTemporary = name;
     }
-    return failure == 0;
+    return isNamed;
 }
 
 void OutputFile::writeOut(std::string_view text) const
@@ -244,8 +234,11 @@ void writeFile(const std::string& name, std::string_view content)
 
 void checkWritable(const std::string& name)
 {
-    struct stat old = {};
-    if (placeOf(name).descriptor || (stat(name.c_str(), &old) == 0 && !S_ISREG(old.st_mode))) {
+    const auto isOther = [&name] {
+        const auto old = system::statusOf(name);
+        return old && !old->isRegular;
+    };
+    if (placeOf(name).descriptor || isOther()) {
         throw Error(name + ": is not a regular file, as results need");
     }
     OutputFile{name};
@@ -253,16 +246,16 @@ void checkWritable(const std::string& name)
 
 void expectOwnFile(const std::string& name, const std::vector<std::string>& inputs, const std::string& content)
 {
-    const auto find = [](const std::string& file, int stream, struct stat& found) {
-        return (file == standardStream ? fstat(stream, &found) : stat(file.c_str(), &found)) == 0;
+    const auto find = [](const std::string& file, int stream) {
+        return file == standardStream ? system::statusOf(stream) : system::statusOf(file);
     };
-    struct stat output = {};
-    if (!find(name, STDOUT_FILENO, output) || !S_ISREG(output.st_mode)) {
+    const auto output = find(name, system::standardOutput);
+    if (!output || !output->isRegular) {
         return;
     }
     for (const std::string& each : inputs) {
-        struct stat input = {};
-        if (find(each, STDIN_FILENO, input) && input.st_dev == output.st_dev && input.st_ino == output.st_ino) {
+        const auto input = find(each, system::standardInput);
+        if (input && input->isSameFileAs(*output)) {
             const auto shown = [](const std::string& file, const char* stream) {
                 return file == standardStream ? stream : file;
             };
@@ -275,13 +268,13 @@ void expectOwnFile(const std::string& name, const std::vector<std::string>& inpu
 bool isSamePlace(const std::string& a, const std::string& b)
 {
     const auto whole = [](const std::string& name) {
-        const std::filesystem::path path = std::filesystem::absolute(placeOf(name).path);
+        const std::filesystem::path path = std::filesystem::absolute(pathOf(placeOf(name).path));
         std::error_code failed;  // a pipe behind /dev/stdout has no path
         const std::filesystem::path canonical = std::filesystem::weakly_canonical(path, failed);
         return failed ? path : canonical;
     };
     const std::filesystem::path place = whole(a);
-    return place == whole(b) && place != "/dev/null";  // which keeps nothing
+    return place == whole(b) && place != system::nowhere;
 }
 
 void expectDistinct(const std::string& file, const std::string& other)

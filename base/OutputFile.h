@@ -52,7 +52,7 @@ public:
     Descriptor commit();
 
 private:
-    void openNew(const std::string& place, mode_t mode);
+    void openNew(const std::string& place, unsigned permissions);
     bool nameNew();
     void writeOut(std::string_view text) const;
     [[noreturn]] void fail() const;

@@ -4,13 +4,13 @@
 
 #include <string>
 
-#include "Descriptor.h"
+#include "System.h"
 
 namespace morvik::base {
 
 /// Owns a file exclusively, from before it exists until it is removed or the process ends. The lock is on the file
-/// itself: a killed process leaves no lock file behind. A new file is empty until written; the destructor removes it if
-/// it never was.
+/// itself, or vanishes with the process: a killed one leaves no lock file behind. A new file is empty until written;
+/// the destructor removes it if it never was.
 class OwnFile {
 public:
     /// If another process owns the file, isTaken() is true. If it cannot be opened, write() fails. Throws Error if the
@@ -18,7 +18,6 @@ public:
     explicit OwnFile(std::string fileName);
     OwnFile(const OwnFile&) = delete;
     OwnFile& operator=(const OwnFile&) = delete;
-    ~OwnFile();
 
     /// Whether another process owns the file.
     bool isTaken() const;
@@ -34,8 +33,7 @@ public:
 
 private:
     std::string itsName;
-    Descriptor itsFile;
-    bool itsIsTaken = false;
+    system::Ownership itsOwnership;
 };
 
 }  // namespace morvik::base

@@ -10,6 +10,7 @@
 #include "Error.h"
 #include "FileKind.h"
 #include "InputFile.h"
+#include "Path.h"
 #include "Text.h"
 
 namespace morvik::base {
@@ -48,7 +49,7 @@ std::string readText(std::istream& file, const std::string& name, std::size_t la
 void expectRegularFile(const std::string& fileName)
 {
     std::error_code none;  // set if there is no such file
-    if (const auto found = std::filesystem::status(fileName, none);
+    if (const auto found = std::filesystem::status(pathOf(fileName), none);
         std::filesystem::exists(found) && !std::filesystem::is_regular_file(found)) {
         throw Error(fileName + ": is not a regular file");
     }

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "Error.h"
+#include "System.h"
 
 namespace morvik::base {
 
@@ -17,8 +18,8 @@ Packing packingOfFile(const std::string& name)
     if (name == standardStream) {
         return Packing::none;
     }
-    struct stat status = {};
-    if (stat(name.c_str(), &status) != 0 || !S_ISREG(status.st_mode)) {
+    const auto status = system::statusOf(name);
+    if (!status || !status->isRegular) {
         return Packing::none;
     }
     std::ifstream file = openFile(name);

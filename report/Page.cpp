@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <filesystem>
 #include <locale>
 #include <sstream>
 
@@ -13,6 +12,7 @@
 #include "base/Error.h"
 #include "base/Numbers.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 #include "base/Text.h"
 
 namespace morvik::report {
@@ -364,7 +364,7 @@ std::vector<Curve> numbered(const std::vector<Curve>& curves)
 
 void checkReport(const std::string& fileName)
 {
-    if (std::filesystem::path(fileName).extension() != ".html") {
+    if (base::pathOf(fileName).extension() != ".html") {
         throw base::Error(fileName + ": is not a name for a report, expected one that ends in .html");
     }
     base::checkWritable(fileName);

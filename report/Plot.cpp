@@ -2,7 +2,6 @@
 #include "Plot.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <system_error>
 
 #include "PlotScript.h"
@@ -11,6 +10,7 @@
 #include "base/ChildProcess.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 
 namespace morvik::report {
 
@@ -24,7 +24,7 @@ namespace {
 /// Returns the format; throws if it is unknown.
 std::string suffixOf(const std::string& fileName)
 {
-    std::string suffix = std::filesystem::path(fileName).extension().string();
+    std::string suffix = base::pathOf(fileName).extension().u8string();
     if (suffix != ".svg" && suffix != ".png" && suffix != ".pdf") {
         fail(fileName, "a plot's format follows from its suffix, expected .svg, .png or .pdf");
     }

@@ -2,7 +2,6 @@
 #include "Reference.h"
 
 #include <cmath>
-#include <filesystem>
 #include <optional>
 #include <sstream>
 #include <string_view>
@@ -10,6 +9,7 @@
 #include "base/Csv.h"
 #include "base/Error.h"
 #include "base/Numbers.h"
+#include "base/Path.h"
 #include "base/Shown.h"
 #include "base/Text.h"
 #include "base/TextFile.h"
@@ -25,7 +25,7 @@ namespace {
 /// What a file of error rates has as CSV.
 std::string csvOf(const std::string& fileName)
 {
-    const bool isJson = std::filesystem::path(fileName).extension() == ".json";
+    const bool isJson = base::pathOf(fileName).extension() == ".json";
     return isJson ? csvText(simulation::readResults(fileName)) : base::readText(fileName);
 }
 
@@ -321,8 +321,7 @@ private:
     /// The curves as references, with the file name in their titles.
     std::vector<Curve> titled(std::vector<Curve> curves) const
     {
-        const std::string name =
-            itsTitle.empty() ? std::filesystem::path(itsName).stem().string() : std::string(itsTitle);
+        const std::string name = itsTitle.empty() ? base::pathOf(itsName).stem().u8string() : std::string(itsTitle);
         for (Curve& curve : curves) {
             for (std::string* const title : {&curve.title, &curve.family}) {
                 *title = title->empty() ? name : name + ": " + *title;

@@ -11,6 +11,7 @@
 #include "base/Error.h"
 #include "base/Json.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 #include "base/Shown.h"
 #include "base/TextFile.h"
 
@@ -21,7 +22,7 @@ namespace {
 bool hasContent(const std::string& fileName)
 {
     std::error_code none;  // if there is no such file
-    return std::filesystem::file_size(fileName, none) > 0 && !none;
+    return std::filesystem::file_size(base::pathOf(fileName), none) > 0 && !none;
 }
 
 }  // namespace

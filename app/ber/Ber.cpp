@@ -2,7 +2,6 @@
 #include "Ber.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <iostream>
 #include <memory>
 #include <optional>
@@ -16,7 +15,9 @@
 #include "Pictures.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 #include "base/Shown.h"
+#include "base/System.h"
 #include "base/Text.h"
 #include "hardware/testbench/Decoder.h"
 #include "simulation/Journal.h"
@@ -45,7 +46,8 @@ std::unique_ptr<simulation::Progress> progressOf(const BerMeans& means,
     if (options.quiet) {
         return std::make_unique<NoTable>();
     }
-    return std::make_unique<LiveTable>(plan, std::cout, means.hasTerminal ? terminalWidth() : std::nullopt);
+    return std::make_unique<LiveTable>(
+        plan, std::cout, means.hasTerminal ? base::system::terminalWidth() : std::nullopt);
 }
 
 std::unique_ptr<simulation::Workers> makeThreads(const BerOptions& options, const simulation::Plan& plan)
@@ -137,7 +139,7 @@ int replayFrame(const BerOptions& options, const simulation::Plan& plan, const R
     }
     const auto [softValues, sentBits, wrongBits] =
         simulation::replay(plan, replayed.point, replayed.frame, options.instructionSet);
-    const std::string stem = std::filesystem::path(options.output).replace_extension().string();
+    const std::string stem = base::pathOf(options.output).replace_extension().u8string();
     const std::string name = stem + (stem.empty() ? "" : ".") + "point" + std::to_string(replayed.point) + ".frame" +
                              std::to_string(replayed.frame);
     base::writeFile(name + ".csv", softValues);

@@ -4,8 +4,8 @@
 
 namespace morvik {
 
-/// Records SIGINT, SIGTERM and SIGHUP during its lifetime; one object at a time. A second signal of the same kind ends
-/// the process at once. Signals that the process ignores stay ignored.
+/// Records SIGINT, SIGTERM and SIGHUP, or what Windows has in their place, during its lifetime; one object at a time. A
+/// second signal of the same kind ends the process at once. Signals that the process ignores stay ignored.
 class Interruption {
 public:
     Interruption();

@@ -1,9 +1,6 @@
 // LiveTable: prints a run's points as a growing table, with a progress line on terminals.
 #include "LiveTable.h"
 
-#include <sys/ioctl.h>
-#include <unistd.h>
-
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
@@ -127,16 +124,6 @@ std::string timeLeft(const Plan& plan, const PointResult& point)
 }
 
 }  // namespace
-
-std::optional<std::size_t> terminalWidth()
-{
-    winsize size = {};
-    if (isatty(STDOUT_FILENO) == 0) {
-        return std::nullopt;
-    }
-    const bool isKnown = ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
-    return isKnown ? size.ws_col : 80;
-}
 
 LiveTable::LiveTable(const Plan& plan, std::ostream& stream, std::optional<std::size_t> width)
     : itsPlan(plan), itsStream(stream), itsWidth(width)

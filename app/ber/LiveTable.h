@@ -13,9 +13,6 @@
 
 namespace morvik {
 
-/// The width in columns of the terminal on standard output; nothing if that is no terminal.
-std::optional<std::size_t> terminalWidth();
-
 /// Prints a heading for each curve and a row for each finished point; given a width, also a progress line that fits it.
 /// Throws base::Error if the table cannot be written.
 class LiveTable : public simulation::Progress {

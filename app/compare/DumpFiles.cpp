@@ -5,6 +5,7 @@
 #include <memory>
 
 #include "base/Error.h"
+#include "base/Path.h"
 #include "base/UnpackedFile.h"
 #include "hardware/vectors/BlockFiles.h"
 
@@ -26,7 +27,7 @@ bool isVcd(const std::string& file, const std::string& form, const base::Unpacke
 /// The format of a table of internal values, or null: CSV has a header of its own.
 const tables::Format* tableFormatOf(const std::string& file, const std::string& form)
 {
-    const std::string ending = std::filesystem::path(file).extension().string();
+    const std::string ending = base::pathOf(file).extension().u8string();
     const std::string name = !form.empty() ? form : ending.empty() ? "" : ending.substr(1);
     return name == "csv" ? nullptr : tables::findFormat(name);
 }
@@ -37,13 +38,13 @@ public:
     TableDump(const std::string& file, const tables::Format& format, const comparison::NameMap& map)
         : itsTable(vectors::internalTable())
     {
-        const std::filesystem::path path = file;
+        const std::filesystem::path path = base::pathOf(file);
         if (map.namesRows || !map.needed.empty()) {
             throw base::Error(file + ": is a table of all signals in their order; a map has no names for it");
         }
         base::openFile(file);  // for the message that all files have
-        itsTable.name = path.stem().string();
-        const std::string folder = path.parent_path().string();
+        itsTable.name = path.stem().u8string();
+        const std::string folder = path.parent_path().u8string();
         itsReader = format.reader(folder.empty() ? "." : folder, itsTable);
     }
 

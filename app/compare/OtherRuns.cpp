@@ -8,6 +8,7 @@
 #include "SoftValueReader.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
+#include "base/Path.h"
 #include "hardware/comparison/Model.h"
 #include "hardware/diagnosis/Mistakes.h"
 #include "simulation/Point.h"
@@ -59,7 +60,7 @@ std::vector<std::string> findBlocks(const ComparedRun& run, const comparison::Va
 {
     std::vector<std::string> found;
     std::error_code ignored;
-    if (!std::filesystem::is_regular_file(run.file, ignored)) {
+    if (!std::filesystem::is_regular_file(base::pathOf(run.file), ignored)) {
         return found;  // it cannot be read again
     }
     try {

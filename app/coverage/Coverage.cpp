@@ -13,6 +13,7 @@
 #include "base/Error.h"
 #include "base/InputFile.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 #include "base/Text.h"
 #include "hardware/coverage/Counts.h"
 #include "hardware/vectors/Set.h"
@@ -129,7 +130,7 @@ void writePage(const std::string& fileName, const coverage::Counts& counts)
 /// The counts of a file, or of a set of vectors.
 coverage::Counts countsOf(const std::string& input)
 {
-    if (std::filesystem::is_directory(input)) {
+    if (std::filesystem::is_directory(base::pathOf(input))) {
         return vectors::situationsOf(input);
     }
     base::InputFile file(input);
@@ -141,8 +142,8 @@ std::vector<std::string> filesOf(const std::vector<std::string>& inputs)
 {
     std::vector<std::string> files;
     for (const std::string& input : inputs) {
-        if (std::filesystem::is_directory(input)) {
-            const std::filesystem::path manifest = std::filesystem::path(input) / vectors::manifestName;
+        if (std::filesystem::is_directory(base::pathOf(input))) {
+            const std::string manifest = (base::pathOf(input) / vectors::manifestName).u8string();
             const std::vector<std::string> ofSet = vectors::filesOf(input, vectors::readManifest(manifest));
             files.insert(files.end(), ofSet.begin(), ofSet.end());
         } else {

@@ -16,7 +16,7 @@ namespace fs = std::filesystem;
 void write(const fs::path& file, const std::string& text)
 {
     fs::create_directories(file.parent_path());
-    morvik::base::OutputFile output(file);
+    morvik::base::OutputFile output(file.u8string());
     output.write(text);
     output.commit();
 }

@@ -1,5 +1,4 @@
 // FstTrace: a trace as a compact waveform, which GTKWave's vcd2fst makes of a value change dump.
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <string>
@@ -11,6 +10,8 @@
 #include "base/ChildProcess.h"
 #include "base/Error.h"
 #include "base/InputFile.h"
+#include "base/Path.h"
+#include "base/System.h"
 
 namespace morvik::trace {
 
@@ -19,10 +20,10 @@ namespace {
 /// A folder for temporary files, removed with them.
 class Workplace {
 public:
-    Workplace() : itsPath((std::filesystem::temp_directory_path() / "morvik-trace-XXXXXX").string())
+    Workplace() : itsPath(base::system::makeTemporaryFolder("morvik-trace-"))
     {
-        if (mkdtemp(itsPath.data()) == nullptr) {
-            throw base::fileError(itsPath, "written");
+        if (itsPath.empty()) {
+            throw base::fileError("the folder for temporary files", "written");
         }
     }
 
@@ -32,7 +33,7 @@ public:
     ~Workplace()
     {
         std::error_code ignored;
-        std::filesystem::remove_all(itsPath, ignored);
+        std::filesystem::remove_all(base::pathOf(itsPath), ignored);
     }
 
     std::string file(const std::string& name) const

@@ -8,6 +8,7 @@
 #include "TransportJson.h"
 #include "base/Error.h"
 #include "base/Json.h"
+#include "base/Path.h"
 #include "base/Shown.h"
 #include "base/TextFile.h"
 #include "base/Thousandths.h"
@@ -289,11 +290,11 @@ Manifest readManifest(const std::string& fileName)
 
 std::vector<std::string> filesOf(const std::string& folder, const Manifest& manifest)
 {
-    const std::filesystem::path path = folder;
-    std::vector<std::string> files = {path / manifestName};
+    const std::filesystem::path path = base::pathOf(folder);
+    std::vector<std::string> files = {(path / manifestName).u8string()};
     for (const ManifestFormat& format : manifest.formats) {
         for (const ManifestFile& file : format.files) {
-            files.push_back(path / file.name);
+            files.push_back((path / base::pathOf(file.name)).u8string());
         }
     }
     return files;

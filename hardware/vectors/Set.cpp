@@ -13,6 +13,7 @@
 #include "SetFolder.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
+#include "base/Path.h"
 
 namespace morvik::vectors {
 
@@ -223,7 +224,7 @@ void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
         }
     }
     for (const std::string& name : others) {
-        if (std::filesystem::exists(pathOf(folder, name))) {
+        if (std::filesystem::exists(base::pathOf(pathOf(folder, name)))) {
             throw base::Error(pathOf(folder, name) + ": is not a file that " + manifestName +
                               " names, and cannot be checked");
         }

@@ -1,10 +1,7 @@
 // SetFolder: the folder of a set of vectors, which is replaced as a whole.
 #include "SetFolder.h"
 
-#include <fcntl.h>
-
 #include <algorithm>
-#include <cstdio>
 #include <filesystem>
 #include <set>
 #include <system_error>
@@ -12,8 +9,8 @@
 
 #include "BlockFiles.h"
 #include "Manifest.h"
-#include "base/Descriptor.h"
 #include "base/Error.h"
+#include "base/Path.h"
 
 namespace morvik::vectors {
 
@@ -35,7 +32,7 @@ std::string pathOf(const std::string& folder, const std::string& name)
 fs::file_type kindOf(const std::string& path)
 {
     std::error_code none;
-    return fs::symlink_status(path, none).type();
+    return fs::symlink_status(base::pathOf(path), none).type();
 }
 
 bool exists(const std::string& path)
@@ -56,6 +53,11 @@ void expectOwnFolder(const std::string& path)
     }
 }
 
+std::string nameOfLock()
+{
+    return base::system::nameOfLock(lockName);
+}
+
 std::string asideIn(const std::string& folder)
 {
     std::string path = pathOf(folder, asideName);
@@ -65,7 +67,7 @@ std::string asideIn(const std::string& folder)
 
 void move(const std::string& from, const std::string& to)
 {
-    if (std::rename(from.c_str(), to.c_str()) != 0) {
+    if (!base::system::moveFile(from, to)) {
         throw base::fileError(to, "written");
     }
 }
@@ -73,8 +75,9 @@ void move(const std::string& from, const std::string& to)
 /// A file, a link, or an empty folder.
 void removeOne(const std::string& path)
 {
-    if (std::remove(path.c_str()) != 0) {
-        throw base::fileError(path, "removed");
+    std::error_code problem;
+    if (!fs::remove(base::pathOf(path), problem)) {
+        throw base::Error(path + ": cannot be removed: " + problem.message());
     }
 }
 
@@ -82,9 +85,9 @@ std::vector<std::string> namesIn(const std::string& folder)
 {
     std::vector<std::string> names;
     std::error_code problem;
-    fs::directory_iterator entry(folder, problem);
+    fs::directory_iterator entry(base::pathOf(folder), problem);
     while (!problem && entry != fs::directory_iterator()) {
-        names.push_back(entry->path().filename().string());
+        names.push_back(entry->path().filename().u8string());
         entry.increment(problem);
     }
     if (problem) {
@@ -124,8 +127,8 @@ void expectSetFiles(const std::string& folder, const std::set<std::string>& othe
 SetFolder::Made::Made(std::string folder) : path(std::move(folder)), isOwn(false)
 {
     std::error_code problem;
-    isOwn = fs::create_directories(path, problem);
-    if (problem || !fs::is_directory(path, problem)) {
+    isOwn = fs::create_directories(base::pathOf(path), problem);
+    if (problem || !fs::is_directory(base::pathOf(path), problem)) {
         throw base::Error(path + ": cannot be made" + (problem ? ": " + problem.message() : ""));
     }
 }
@@ -134,7 +137,7 @@ SetFolder::Made::~Made()
 {
     std::error_code ignored;  // if it is not empty
     if (isOwn) {
-        fs::remove(path, ignored);
+        fs::remove(base::pathOf(path), ignored);
     }
 }
 
@@ -193,7 +196,7 @@ void SetFolder::place()
         moveBack();
         throw;
     }
-    base::Descriptor(open(itsFolder.path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)).sync();
+    base::system::syncFolder(itsFolder.path);
     clearAside();
 }
 
@@ -257,7 +260,7 @@ void SetFolder::clearAside() const
         }
     }
     for (const std::string& name : namesIn(aside())) {
-        if (name != lockName) {
+        if (name != nameOfLock()) {
             removeOne(made(name));
         }
     }
@@ -265,7 +268,7 @@ void SetFolder::clearAside() const
 
 void SetFolder::expectOwnAside() const
 {
-    expectSetFiles(aside(), {lockName, earlierName});
+    expectSetFiles(aside(), {nameOfLock(), earlierName});
     expectOwnFolder(made(earlierName));
     if (exists(made(earlierName))) {
         expectSetFiles(made(earlierName), {});
