@@ -9,7 +9,9 @@ set(library morvik_v1_0_bitacc_cmodel)
 set(CMAKE_INSTALL_DEFAULT_COMPONENT_NAME library)
 set_target_properties(morvik_classes PROPERTIES EXPORT_NAME classes)
 install(TARGETS ${library} morvik_classes EXPORT ${library}
+    RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR}
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR}
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} PATTERN morvik_link.h EXCLUDE
     PATTERN morvik_checker.h EXCLUDE PATTERN morvik_units.h EXCLUDE)
@@ -50,6 +52,9 @@ install(TARGETS ${commands} RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONEN
 
 # Manual pages, completions, and the documents that they refer to.
 foreach(command IN LISTS commands)
+    if(NOT MORVIK_REFERENCE_DIR)
+        break()
+    endif()
     install(DIRECTORY ${MORVIK_REFERENCE_DIR}/${command}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} COMPONENT command)
 endforeach()
 install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT documents
@@ -57,15 +62,27 @@ install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT documents
 
 set_target_properties(morvik_link_c PROPERTIES EXPORT_NAME morvik_link)
 install(TARGETS morvik_link_c EXPORT morvik_link
+    RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT link
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT link
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT link
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(FILES include/morvik_link.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT link)
 
 set_target_properties(morvik_checker_c PROPERTIES EXPORT_NAME morvik_checker)
 install(TARGETS morvik_checker_c EXPORT morvik_checker
+    RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT checker
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT checker
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT checker
     INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(FILES include/morvik_checker.h include/morvik_units.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT checker)
+
+# On Windows, other compilers make their own import libraries, of the lists of exports.
+if(WIN32)
+    install(FILES src/exports.def DESTINATION ${CMAKE_INSTALL_LIBDIR} RENAME ${library}.def)
+    install(FILES link/exports.def DESTINATION ${CMAKE_INSTALL_LIBDIR} RENAME morvik_link.def COMPONENT link)
+    install(FILES hardware/checker/exports.def DESTINATION ${CMAKE_INSTALL_LIBDIR} RENAME morvik_checker.def
+        COMPONENT checker)
+endif()
 
 # What finds a library: a CMake package and a pkg-config file. A consumer of the other word size gets a message rather
 # than a linker error.

@@ -50,8 +50,8 @@
 #include <stddef.h>
 #include <stdint.h>
 
-/** Marks what the library exports. */
-#if defined(__GNUC__)
+/** Marks what the library exports; on Windows a .def file lists it. */
+#if defined(__GNUC__) && !defined(_WIN32)
 #define MORVIK_LINK_API __attribute__((visibility("default")))
 #else
 #define MORVIK_LINK_API

@@ -44,8 +44,8 @@
 
 #include <stdint.h>
 
-/** Marks what the library exports. */
-#if defined(__GNUC__)
+/** Marks what the library exports; on Windows a .def file lists it. */
+#if defined(__GNUC__) && !defined(_WIN32)
 #define MORVIK_API __attribute__((visibility("default")))
 #else
 #define MORVIK_API

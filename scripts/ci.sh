@@ -2,7 +2,7 @@
 # Runs the stages of continuous integration locally, all or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew mutate packages starts memory-short lint-short
+# named: abi-renew mutate packages starts memory-short lint-short windows
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -180,6 +180,14 @@ stage_coverage() {
 count_lines() {
     gcovr --root . --filter "$1" --exclude-throw-branches --exclude-unreachable-branches \
         --fail-under-line 97 --fail-under-branch 90 --html-details build/coverage/report.html build/coverage
+}
+
+# Runs only when named. What is built for Windows, in Wine, compared with the Linux command.
+stage_windows() {
+    scripts/setup --windows
+    scripts/build x86_64 morvik
+    scripts/build windows all lane_decoder_test System_test
+    ctest --test-dir build/windows --output-on-failure
 }
 
 # Runs only when named: takes most of an hour.
