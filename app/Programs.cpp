@@ -18,7 +18,7 @@ Program::Program(const std::string& name, const std::string& description)
     : arguments(std::make_unique<CLI::App>(description, name))
 {
     arguments->set_version_flag("--version", name + " " MORVIK_VERSION, "Print the version and exit");
-    arguments->require_subcommand(0, 1);  // so that a file may be named like a subcommand
+    arguments->require_subcommand(0, 1);            // so that a file may be named like a subcommand
     arguments->allow_windows_style_options(false);  // the same command line everywhere
 }
 

@@ -49,6 +49,11 @@ def tool(name, *arguments):
     return result.stdout.decode()
 
 
+def exports_of(library):
+    table = tool("objdump", "-p", PROGRAMS / f"{library}.dll").partition("[Ordinal/Name Pointer]")[2]
+    return re.findall(r"^\t\[ *\d+\] (\w+)$", table, re.MULTILINE)
+
+
 def without_times(text):
     """Results without the seconds that they took."""
     text = re.sub(rb'"seconds": [0-9.]+', b'"seconds": 0', text)
@@ -95,10 +100,15 @@ class Built(unittest.TestCase):
 
     def test_exports_the_interface_for_c(self):
         for library, names in LIBRARIES.items():
-            table = tool("objdump", "-p", PROGRAMS / f"{library}.dll").partition("[Ordinal/Name Pointer]")[2]
-            exported = re.findall(r"^\t\[ *\d+\] (\w+)$", table, re.MULTILINE)
             listed = re.findall(r"^(?:veltra|morvik)_\w+$", (ROOT / "tests/data" / names).read_text(), re.MULTILINE)
-            self.assertEqual(sorted(exported), sorted(listed))
+            self.assertEqual(sorted(exports_of(library)), sorted(listed))
+
+    def test_exports_what_systemverilog_imports(self):
+        exported = exports_of("morvik_dpi")
+        package = (ROOT / "bindings/systemverilog/morvik_pkg.sv").read_text()
+        imported = re.findall(r'import "DPI-C".*?\b(morvik_\w+) *\(', package)
+        self.assertGreater(len(imported), 20)
+        self.assertLessEqual(set(imported), set(exported))
 
     def test_moves_no_wide_vector_as_if_the_stack_were_aligned(self):
         for file in (MORVIK, PROGRAMS / "morvik_v1_0_bitacc_cmodel.dll"):
