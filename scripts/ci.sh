@@ -2,7 +2,7 @@
 # Runs the stages of continuous integration locally, all or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew mutate packages starts memory-short lint-short windows
+# named: abi-renew mutate packages archives starts memory-short lint-short windows
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -200,6 +200,27 @@ stage_mutate() {
 stage_packages() {
     scripts/packages
     tests/packages/clean_root.sh build/packages
+}
+
+# Runs only when named: builds every archive twice, the second time in another folder and without a cache of compilations.
+# Each does what it should where there is nothing else, and the second is the same file. ARCHIVES names systems, else all.
+stage_archives() {
+    local other archive systems
+    read -ra systems <<<"${ARCHIVES:-}"
+    scripts/archives "${systems[@]}"
+    for archive in build/archives/morvik-*; do
+        tests/archives/use.sh "$archive"
+    done
+    other=$(mktemp -d)
+    trap 'rm -rf "$other"; trap - RETURN' RETURN
+    git ls-files -z | tar --create --null --files-from=- | tar --extract --directory="$other"
+    SOURCE_DATE_EPOCH=$(git log -1 --format=%ct) CCACHE_DISABLE=1 "$other/scripts/archives" "${systems[@]}"
+    for archive in build/archives/*; do
+        case $archive in
+            *.log) ;;
+            *) cmp "$archive" "$other/$archive" ;;
+        esac
+    done
 }
 
 # Runs everything that is rarely run in its shortest form, so that it keeps working.
