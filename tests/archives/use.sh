@@ -110,6 +110,20 @@ fi
 # shellcheck disable=SC2086
 "$CC" $flags -std=c99 "$here/host.c" -o "$folder/host" -ldl -pthread
 "${emulator[@]}" "$folder/host" lib/libmorvik_dpi.so
+if [ "$flags" = -m64 ] && command -v mkoctfile >/dev/null; then
+    functions=$source/bindings/octave
+    make_function() {
+        CXXFLAGS="-O1 -std=c++17" mkoctfile --mex -I$source -Iinclude -Iinclude/morvik_v1_0_classes -Llib \
+            --output "$functions/private/$1.mex" "$functions/$1.cpp" "${@:2}"
+    }
+    make_function morvik_mex $source/link/coding/TurboEncoder.cpp -lmorvik_v1_0_bitacc_cmodel
+    make_function morvik_unit_mex -lmorvik_checker
+    LD_LIBRARY_PATH=lib octave-cli --no-history --norc --path "$functions" --eval "
+        bits = rand(40, 3) < 0.5;
+        [a, b, c] = morvik_encode(bits);
+        assert(isequal(morvik_decode(16 * (2 * a - 1), 16 * (2 * b - 1), 16 * (2 * c - 1)), bits));
+        assert(numel(morvik_unit_tail(zeros(1, 3), zeros(1, 3))), 8);"
+fi
 if [ -e /usr/include/iverilog/vpi_user.h ]; then
     compile -I/usr/include/iverilog -c $source/bindings/icarus/morvik_vpi.cpp -o "$folder/vpi.o"
 fi
