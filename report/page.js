@@ -1,10 +1,7 @@
-// Draws the curves of the report, and shows the figures of the point that is looked at.
+// Draws the curves of the report, and shows the figures of the point that is looked at. A page whose curves grow hands
+// over new ones as the details of an event "curves".
 "use strict";
 (() => {
-    const {rows, views} = JSON.parse(document.getElementById("data").textContent);
-    for (const curve of views.flatMap(view => view.curves)) {
-        curve.samples = curve.samples.map(row => rows[row]);
-    }
     const chart = document.getElementById("chart");
     const tip = document.getElementById("tip");
     const bars = document.getElementById("bars");
@@ -29,10 +26,8 @@
     const dashes = ["none", "9 5", "3 3", "10 4 2 4"];
     const arrowLength = 0.4;  // a bound's arrow goes down to this fraction of it
     const reach = 48;         // in pixels, within which a point is found by the pointer
-    const hidden = new Set();
-    // Where there is one Eb/N0 only, the curves are those against iterations.
-    let {axis, curves} = views.find(view => view.curves.some(curve => curve.samples.length > 1)) ?? views[0];
-    let quantity = rows.some(row => row.bits !== null) ? "bits" : "ber";
+    const hidden = new Set();  // names of curves
+    let rows, views, axis, curves, quantity;
     let places = [];    // what was drawn: {curve, sample, x, y}
     let current = null; // the one that is looked at
 
@@ -46,6 +41,8 @@
     }
 
     const rounded = value => Math.round(value * 100) / 100;
+    const nameOf = curve => `${axis} ${curve.index}`;
+    const isHidden = curve => hidden.has(nameOf(curve));
     const colourOf = curve => `var(--${curve.colour})`;
     const isLinear = () => quantity === "bits";  // the other axes are logarithmic
     const drawn = rate => rate !== null && ((rate.below ? rate.high : rate.value) > 0 || isLinear());
@@ -224,7 +221,7 @@
     }
 
     function describe() {
-        const shown = curves.filter(curve => !hidden.has(curve)).map(curve => curve.title);
+        const shown = curves.filter(curve => !isHidden(curve)).map(curve => curve.title);
         return `${names[quantity]} against ${axisOf[axis].words}${isLinear() ? "" : ", on a logarithmic scale"}. ` +
             `Series: ${shown.join("; ") || "none"}. The table below has all the figures.`;
     }
@@ -241,7 +238,7 @@
         }
         for (const wanted of [true, false]) {
             for (const curve of curves) {
-                if (curve.reference === wanted && !hidden.has(curve)) {
+                if (curve.reference === wanted && !isHidden(curve)) {
                     content.append(drawCurve(curve, scale));
                 }
             }
@@ -256,10 +253,12 @@
             element("rect", {width, height, fill: "none"}), content);
         chart.querySelector("svg")?.remove();
         chart.prepend(svg);
-        look(current && places.find(place => place.sample === current.sample) || null);
+        look(current && places.find(place => isSame(place, current)) || null);
     }
 
     // ---- The point that is looked at
+
+    const isSame = (a, b) => a.curve.index === b.curve.index && a.sample.row === b.sample.row;
 
     function pair(list, name, value, detail) {
         const term = document.createElement("dt");
@@ -371,10 +370,10 @@
 
     // ---- What to draw
 
-    function addLegend(curve) {
+    function legendItem(curve) {
         const button = document.createElement("button");
         button.type = "button";
-        button.setAttribute("aria-pressed", String(!hidden.has(curve)));
+        button.setAttribute("aria-pressed", String(!isHidden(curve)));
         button.append(
             element("svg", {width: 40, height: 16, "aria-hidden": "true"},
                 element("path", {
@@ -383,26 +382,47 @@
                 marker(curve, 20, 8, sizeOf(curve))),
             curve.title);
         button.addEventListener("click", () => {
-            if (!hidden.delete(curve)) {
-                hidden.add(curve);
+            if (!hidden.delete(nameOf(curve))) {
+                hidden.add(nameOf(curve));
             }
-            button.setAttribute("aria-pressed", String(!hidden.has(curve)));
+            button.setAttribute("aria-pressed", String(!isHidden(curve)));
             draw();
         });
         const item = document.createElement("li");
         item.append(button);
-        legend.append(item);
+        return item;
     }
 
-    curves.forEach(addLegend);
+    // Where there is one Eb/N0 only, the curves are those against iterations.
+    function firstView() {
+        return views.find(view => view.curves.some(curve => curve.samples.length > 1)) ?? views[0];
+    }
+
+    function show(view) {
+        ({axis, curves} = view);
+        const titles = curves.map(curve => curve.title);
+        if (titles.join("\n") !== Array.from(legend.children, item => item.textContent).join("\n")) {
+            legend.replaceChildren(...curves.map(legendItem));
+        }
+        draw();
+    }
+
+    function take(data) {
+        ({rows, views} = data);
+        for (const curve of views.flatMap(view => view.curves)) {
+            curve.samples = curve.samples.map(row => rows[row]);
+        }
+        quantity ??= rows.some(row => row.bits !== null) ? "bits" : "ber";
+        show(views.find(view => view.axis === axis) ?? firstView());
+    }
+
+    take(JSON.parse(document.getElementById("data").textContent));
+    addEventListener("curves", event => take(event.detail));
     for (const choice of document.querySelectorAll("input[name=axis]")) {
         choice.checked = choice.value === axis;
         choice.addEventListener("change", () => {
-            ({axis, curves} = views.find(view => view.axis === choice.value));
             look(null);
-            legend.replaceChildren();
-            curves.forEach(addLegend);
-            draw();
+            show(views.find(view => view.axis === choice.value));
         });
     }
     for (const choice of document.querySelectorAll("input[name=quantity]")) {
@@ -414,5 +434,4 @@
     }
     bars.addEventListener("change", draw);
     addEventListener("resize", draw);
-    draw();
 })();

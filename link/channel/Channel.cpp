@@ -1,11 +1,11 @@
 // Channel: BPSK over additive white Gaussian noise, and the quantiser behind it.
 //
-// Probabilities are computed in 80-bit floating point, which g++ and clang++ have for both word sizes, and then rounded
-// to integers.
+// Probabilities are computed in floating point of 64 bits or more (WideMath.h), and then rounded to integers.
 #include "Channel.h"
 
 #include <cmath>
 
+#include "WideMath.h"
 #include "rules/Tail.h"
 
 namespace morvik::link {
@@ -15,7 +15,7 @@ namespace {
 /// The probability that a standard Gaussian variable is greater than x.
 long double upperTail(long double x)
 {
-    return std::erfc(x / std::sqrt(2.0L)) / 2;
+    return wideErfc(x / std::sqrt(2.0L)) / 2;
 }
 
 /// The probability of a value below x, times 2^48. The smaller tail is the one that is rounded.
@@ -40,7 +40,7 @@ std::uint64_t share(long double part, long double whole)
 long double noiseDeviation(unsigned K, int milliDecibels)
 {
     const long double rate = static_cast<long double>(K) / (3.0L * K + rules::tailValues);
-    const long double ratio = std::pow(10.0L, milliDecibels / 10000.0L);
+    const long double ratio = widePowerOfTen(milliDecibels / 10000.0L);
     return 1 / std::sqrt(2 * rate * ratio);  // for energy 1 per transmitted value
 }
 

@@ -6,6 +6,8 @@
 #include <cmath>
 #include <numeric>
 
+#include "link/channel/WideMath.h"
+
 namespace {
 
 using namespace morvik::link;
@@ -107,4 +109,24 @@ TEST(Channel, ClipsToEightBits)
         EXPECT_EQ(soft.value, rounded < -128 ? -128 : rounded > 127 ? 127 : rounded);
         EXPECT_EQ(soft.clipped, soft.value != rounded);
     }
+}
+
+TEST(WideMath, SeriesGiveWhatAWideLibraryGives)
+{
+    // Within some units of the last place of 64 bits; the sum of a tail and its complement keeps what is absolute.
+    constexpr long double unit = 0x1p-63L;
+    for (int i = -400; i <= 4000; ++i) {
+        const long double x = i / 64.0L;
+        const long double expected = std::erfc(x);
+        const long double lost = x > 0 && x < 3 ? unit : 0;  // 1 - erf
+        EXPECT_LE(std::fabs(series::erfc(x) - expected), (8 + x * x) * unit * expected + 16 * lost)
+            << "x = " << i << " / 64";
+    }
+    for (int milliDecibels = -50000; milliDecibels <= 50000; milliDecibels += 37) {
+        const long double x = milliDecibels / 10000.0L;
+        const long double expected = std::pow(10.0L, x);
+        EXPECT_LE(std::fabs(series::powerOfTen(x) - expected), 16 * unit * expected) << milliDecibels;
+    }
+    EXPECT_EQ(series::exponential(0), 1);
+    EXPECT_EQ(series::erfc(0), 1);
 }
