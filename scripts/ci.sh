@@ -2,7 +2,7 @@
 # Runs the stages of continuous integration locally, all or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew mutate packages archives starts memory-short lint-short windows
+# named: abi-renew archives browser browser-short lint-short memory-short mutate packages starts windows
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -37,10 +37,10 @@ tidy() {
     scripts/build x86_64
     # Standard error has the number of suppressed warnings, and the reason if it could not run.
     local log=build/x86_64/lint.log
-    # A unit of bench/ needs a package that is not installed here, Octave's own compiler builds its functions, and Windows'
-    # units need its headers.
+    # A unit of bench/ needs a package that is not installed here, compilers of their own build the functions of Octave and
+    # the module of WebAssembly, and Windows' units need its headers.
     git ls-files "$@" |
-        grep -vxE 'bench/ItppDecoding\.cpp|bindings/octave/.*|base/SystemWindows.*' |
+        grep -vxE 'bench/ItppDecoding\.cpp|bindings/(octave|javascript)/.*|base/SystemWindows.*' |
         xargs scripts/lint-units build/x86_64 build/lint |
         xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet --checks=-bugprone-suspicious-include "${analyzer[@]}" \
             2>"$log" || { cat "$log" >&2; return 1; }
@@ -189,6 +189,21 @@ stage_windows() {
     scripts/build x86_64 morvik
     scripts/build windows all lane_decoder_test System_test
     ctest --test-dir build/windows --output-on-failure
+}
+
+# The page in the browser and the npm package.
+stage_browser() {
+    scripts/browser
+    scripts/build x86_64 morvik
+    MORVIK_PACKAGE=build/browser/package MORVIK_COMMAND=build/x86_64/bin/morvik node --test bindings/javascript/tests/module.test.mjs
+    bindings/javascript/tests/page_in_browser.py build/x86_64/bin/morvik build/browser/morvik.html
+}
+
+# That the module with vectors gives the promised bits.
+stage_browser-short() {
+    scripts/setup --browser
+    scripts/build browser morvik-simd
+    node bindings/javascript/tests/self_check.mjs build/browser/bin/morvik-simd.wasm
 }
 
 # Runs only when named: takes most of an hour.

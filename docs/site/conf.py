@@ -39,6 +39,21 @@ html_show_sourcelink = False
 highlight_language = "none"
 
 
+PAGE = ROOT / "build/browser/morvik.html"  # where scripts/browser has built it
+html_extra_path = [str(PAGE)] if PAGE.exists() else []
+
+
+def link_page(app, doctree, docname):
+    """Where a clone names the file of the page in the browser, the site leads to the page, if it has it."""
+    if docname != "docs/browser" or not PAGE.exists():
+        return
+    for name in list(doctree.findall(nodes.literal)):
+        if name.astext() == str(PAGE.relative_to(ROOT)):
+            link = nodes.reference("", "", refuri=f"../{PAGE.name}", internal=False)
+            name.replace_self(link)
+            link += nodes.Text("the page in the browser")
+
+
 def name_pages(app, doctree, docname):
     """Where a clone shows the name of a linked file, as compare.md, the site shows the page's title."""
     here = posixpath.dirname(app.builder.get_target_uri(docname))
@@ -51,3 +66,4 @@ def name_pages(app, doctree, docname):
 
 def setup(app):
     app.connect("doctree-resolved", name_pages)
+    app.connect("doctree-resolved", link_page)

@@ -2,7 +2,8 @@
 //
 // The probabilities of the channel are rounded to multiples of 2^-48, which a double's 53 bits do not decide. glibc and
 // the x87 unit compute in 64 bits or more. The library of WebAssembly (musl) has a long double of 113 bits, but
-// computes these functions in double: there, the series below stand in.
+// computes these functions in double: there, the series below stand in. One point of two thousand then has a
+// probability that the x87 unit rounds to the neighbouring multiple, which decides one soft value of some 10^14.
 #ifndef MORVIK_LINK_CHANNEL_WIDEMATH_H
 #define MORVIK_LINK_CHANNEL_WIDEMATH_H
 

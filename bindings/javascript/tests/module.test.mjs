@@ -1,7 +1,7 @@
 // The module in Node.js, against the command. MORVIK_PACKAGE is the folder of the package, MORVIK_COMMAND the command.
 import assert from "node:assert/strict";
 import {execFileSync} from "node:child_process";
-import {mkdtempSync, readFileSync, rmSync} from "node:fs";
+import {mkdtempSync, readFileSync, rmSync, writeFileSync} from "node:fs";
 import {tmpdir} from "node:os";
 import {join, resolve} from "node:path";
 import {after, test} from "node:test";
@@ -127,6 +127,19 @@ test("the automatic scale is the command's", () => {
     run("ber", "--block-size", "512", "--algorithm", "table", "--ebn0", "1", "--max-blocks", "1", "--quiet", "--output", "scale.csv");
     const [row] = rowsOf(readFileSync(join(folder, "scale.csv"), "utf8"));
     assert.equal(vectors.scaleOf({blockSize: 512, ebn0: 1, algorithm: 2}), Number(row.scale));
+});
+
+test("the examples of the document print what they say", () => {
+    const place = pathToFileURL(resolve(process.env.MORVIK_PACKAGE, "morvik.js"));
+    const text = readFileSync(new URL("../../../docs/browser.md", import.meta.url), "utf8");
+    const examples = Array.from(text.matchAll(/^```js\n(.*?)^```/gms), found => found[1]);
+    assert.equal(examples.length, 2);
+    for (const example of examples) {
+        const file = join(folder, "example.mjs");
+        writeFileSync(file, example.replace('"morvik"', `"${place}"`));
+        const [, expected] = /\/\/ prints: (.*)/.exec(example);
+        assert.equal(execFileSync(process.execPath, [file], {encoding: "utf8"}), expected + "\n");
+    }
 });
 
 test("what is not allowed is refused by name", () => {
