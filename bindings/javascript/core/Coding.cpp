@@ -1,5 +1,7 @@
 // Coding: encoder, channel, decoder and cut of single blocks, as functions that WebAssembly exports. Arguments have
 // been checked by morvik.js.
+#include <algorithm>
+#include <cstddef>
 #include <cstdint>
 #include <vector>
 
@@ -75,8 +77,8 @@ MORVIK_EXPORT std::uint32_t morvikSend(const javascript::Point* point,
         link::samplerForms().front());
     std::uint32_t clipped = 0;
     for (std::uint32_t s = 0; s < streams.size(); ++s) {
-        sampler.put(
-            random, s * link::FrameSource::streamStride, streams[s].block(0), length, soft + s * length, clipped);
+        sampler.put(random, s * link::FrameSource::streamStride, streams[s].block(0), length, soft, clipped);
+        soft += length;
     }
     sampler.draw();
     return clipped;
@@ -115,8 +117,8 @@ MORVIK_EXPORT std::int32_t morvikDecode(unsigned units,
     outputs.ratios_alloc = outputs.dout_alloc;
     return veltra_ip_morvik_v1_0_batch_simulate_i8(javascript::decoderOf(units, algorithm),
                                                    soft,
-                                                   soft + blocks * length,
-                                                   soft + 2 * blocks * length,
+                                                   soft + length * blocks,
+                                                   soft + length * 2 * blocks,
                                                    static_cast<std::int32_t>(length),
                                                    blocks,
                                                    iterations,

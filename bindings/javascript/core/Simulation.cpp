@@ -2,8 +2,11 @@
 // have been checked by morvik.js.
 #include <algorithm>
 #include <cmath>
+#include <cstddef>
 #include <cstdint>
 #include <cstdio>
+#include <iterator>
+#include <utility>
 
 #include "Export.h"
 #include "Points.h"
