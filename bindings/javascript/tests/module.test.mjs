@@ -1,13 +1,15 @@
 // The module in Node.js, against the command. MORVIK_PACKAGE is the folder of the package, MORVIK_COMMAND the command.
 import assert from "node:assert/strict";
 import {execFileSync} from "node:child_process";
-import {mkdtempSync, readFileSync, rmSync, writeFileSync} from "node:fs";
+import {mkdtempSync, readFileSync, readdirSync, rmSync, writeFileSync} from "node:fs";
 import {tmpdir} from "node:os";
-import {join, resolve} from "node:path";
+import {dirname, join, resolve} from "node:path";
 import {after, test} from "node:test";
 import {pathToFileURL} from "node:url";
 
-const {ALGORITHMS, load} = await import(pathToFileURL(resolve(process.env.MORVIK_PACKAGE, "morvik.js")));
+const place = resolve(process.env.MORVIK_PACKAGE);
+const exported = await import(pathToFileURL(join(place, "morvik.js")));
+const {ALGORITHMS, Count, Morvik, load} = exported;
 const command = resolve(process.env.MORVIK_COMMAND);
 const folder = mkdtempSync(join(tmpdir(), "morvik-javascript-"));
 after(() => rmSync(folder, {recursive: true}));
@@ -129,17 +131,29 @@ test("the automatic scale is the command's", () => {
     assert.equal(vectors.scaleOf({blockSize: 512, ebn0: 1, algorithm: 2}), Number(row.scale));
 });
 
-test("the examples of the document print what they say", () => {
-    const place = pathToFileURL(resolve(process.env.MORVIK_PACKAGE, "morvik.js"));
+test("the installed package runs the examples of the document", () => {
+    const file = readdirSync(dirname(place)).find(name => name.endsWith(".tgz"));
+    execFileSync("npm", ["install", "--offline", "--no-audit", "--no-fund", "--silent", join(dirname(place), file)], {cwd: folder});
     const text = readFileSync(new URL("../../../docs/browser.md", import.meta.url), "utf8");
     const examples = Array.from(text.matchAll(/^```js\n(.*?)^```/gms), found => found[1]);
     assert.equal(examples.length, 2);
     for (const example of examples) {
-        const file = join(folder, "example.mjs");
-        writeFileSync(file, example.replace('"morvik"', `"${place}"`));
+        writeFileSync(join(folder, "example.mjs"), example);
         const [, expected] = /\/\/ prints: (.*)/.exec(example);
-        assert.equal(execFileSync(process.execPath, [file], {encoding: "utf8"}), expected + "\n");
+        assert.equal(execFileSync(process.execPath, ["example.mjs"], {cwd: folder, encoding: "utf8"}), expected + "\n");
     }
+});
+
+test("every function is declared, and every declared one is there", () => {
+    const text = readFileSync(join(place, "morvik.d.ts"), "utf8");
+    const membersOf = name => new RegExp(`^export declare class ${name} \\{\n(.*?)^\\}`, "ms").exec(text)[1];
+    for (const of of [Morvik, Count]) {
+        const declared = Array.from(membersOf(of.name).matchAll(/^    (\w+)\(/gm), found => found[1]);
+        const there = Object.getOwnPropertyNames(of.prototype).filter(name => name !== "constructor" && !name.startsWith("_"));
+        assert.deepEqual(declared.sort(), there.sort());
+    }
+    const names = Array.from(text.matchAll(/^export declare (?:class|const|function) (\w+)/gm), found => found[1]);
+    assert.deepEqual(names.sort(), Object.keys(exported).sort());
 });
 
 test("what is not allowed is refused by name", () => {

@@ -117,6 +117,18 @@ class PageInBrowser(unittest.TestCase):
         self.assertEqual(self.text("#settings-mistake"), "")
         self.assertIn("with the vectors", self.text("#footer"))
 
+    def test_decodes_where_there_are_no_vectors(self):
+        script = self.browser.call("Page.addScriptToEvaluateOnNewDocument", source="WebAssembly.validate = () => false;")
+        try:
+            self.open()
+            self.assertIn("without the vectors", self.text("#footer"))
+            self.set(512, 8, "scaled", 8, 0.7, 1)
+            self.check_block(3)
+            self.simulate(**{"from": 0, "to": 0.5, "step": 0.5, "block_errors": 20, "max_blocks": 100})
+            self.check_sweep()
+        finally:
+            self.browser.call("Page.removeScriptToEvaluateOnNewDocument", identifier=script["identifier"])
+
     # ---- One block
 
     def check_block(self, number):
