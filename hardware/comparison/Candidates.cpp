@@ -95,6 +95,9 @@ public:
                 addKeptIn(bits);
             }
         }
+        if (stage == Stage::forward) {
+            add(otherKnownMetric(faults.front().got));
+        }
         addOtherPlaces();
         addRounding(faults);
         addRelations();

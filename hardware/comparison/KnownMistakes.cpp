@@ -201,9 +201,10 @@ constexpr std::array<NamedMistake, 4> neighbourMistakes = {{
      "border metrics are those of the second neighbour after the right one (rules 19 and 20)"},
 }};
 
-constexpr std::array<NamedMistake, 2> forwardStartMistakes = {{
+constexpr std::array<NamedMistake, 3> forwardStartMistakes = {{
     {{Mistake::segmentsShifted, -1}, "segments start one step early (rules 17 and 19)"},
     {{Mistake::segmentsShifted, 1}, "segments start one step late (rules 17 and 19)"},
+    {Mistake::startKnown, "segments start from the known state, not from an unknown one (rules 10 and 19)"},
 }};
 
 /// The backward recursion comes from behind: what starts late for it starts at an earlier step.
@@ -391,6 +392,7 @@ private:
         if (itsStage == Stage::intrinsic) {
             return;
         }
+        add({Mistake::parityOfOtherCode, "the parity values are those of the other code (rule 5)"}, Candidate::borders);
         add({{Mistake::tailClipped, 8},
              "the tail's branch sums are clipped like branch metrics (rule 12: they are not)"},
             Candidate::borders);
@@ -461,6 +463,15 @@ private:
 std::vector<KnownMistake> knownMistakes(const Model& model, Stage stage)
 {
     return KnownList(model, stage).all();
+}
+
+KnownMistake otherKnownMetric(int metric)
+{
+    const int right = rules::knownMetric(1, rules::smallestOf(rules::stateBits));
+    return {{Mistake::knownAs, metric},
+            "states other than 0 start with " + std::to_string(metric) + ", not with " + std::to_string(right) +
+                " (rule 10)",
+            Candidate::borders};
 }
 
 KnownMistake otherMask(int mask)

@@ -30,6 +30,9 @@ std::vector<KnownMistake> knownMistakes(const Model& model, Stage stage);
 /// The mistakes of a stage in which a size is fitted: factors and addresses. There are hundreds.
 std::vector<KnownMistake> fittedMistakes(const Model& model, Stage stage);
 
+/// Metrics of states in which the encoder is known not to be, in eighths.
+KnownMistake otherKnownMetric(int metric);
+
 /// Border metrics ANDed with a mask, in eighths.
 KnownMistake otherMask(int mask);
 

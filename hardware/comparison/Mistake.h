@@ -75,6 +75,8 @@ struct Mistake {
         forwardMisread,      ///< ratios from forward metrics of another step
         backwardMisread,     ///< ratios from backward metrics of another step
         ratioMisread,        ///< extrinsic values from the ratio of another step
+        knownAs,             ///< the metric of states in which the encoder is known not to be: `number` eighths
+        startKnown,          ///< segments start from the known state, not from an unknown one
         borderMask,          ///< border columns ANDed with `number`, in eighths
         borderUnknown,       ///< border columns of zeros
         borderOfThisPass,    ///< instead of the last pass's

@@ -296,13 +296,12 @@ private:
     std::array<std::optional<std::vector<Sample>>, stages.size()> itsRight;  ///< right values, once they are asked for
 };
 
-/// How many values of the dump equal the model's once its numbers are shifted, of those that are right unshifted and of
-/// those that are wrong.
+/// Values of the dump that tell whether its numbers are shifted: wrong ones, and right ones where the model has others
+/// at the place that they would be for.
 struct Agreement {
-    std::uint64_t right = 0;
-    std::uint64_t rightEqual = 0;
     std::uint64_t wrong = 0;
-    std::uint64_t wrongEqual = 0;
+    std::uint64_t telling = 0;
+    std::uint64_t equal = 0;  ///< of these: equal to the model once shifted
 };
 
 Agreement agreement(const Model& model, const Values& dump, unsigned passes, unsigned steps)
@@ -313,11 +312,13 @@ Agreement agreement(const Model& model, const Values& dump, unsigned passes, uns
             for (unsigned step = steps; step < dump.steps(); ++step) {
                 const Place theirs = {pass, signal, step};
                 const Place ours = {pass - passes, signal, step - steps};
-                if (dump.has(theirs) && model.values.has(ours)) {
-                    const bool equal = dump.at(theirs) == model.values.at(ours);
+                // Tables have zeros where the core computes nothing.
+                if (dump.has(theirs) && model.values.has(theirs) && model.values.has(ours)) {
+                    const bool isEqual = dump.at(theirs) == model.values.at(ours);
                     const bool isRight = dump.at(theirs) == model.values.at(theirs);
-                    ++(isRight ? found.right : found.wrong);
-                    (isRight ? found.rightEqual : found.wrongEqual) += equal ? 1U : 0U;
+                    found.wrong += isRight ? 0U : 1U;
+                    found.telling += isRight && isEqual ? 0U : 1U;
+                    found.equal += isEqual && !isRight ? 1U : 0U;
                 }
             }
         }
@@ -392,10 +393,8 @@ std::vector<std::string> findShifts(const Model& model, const Values& dump)
     double best = 0;
     for (const Shift& shift : shifts) {
         const Agreement each = agreement(model, dump, shift.passes, shift.steps);
-        const double part =
-            static_cast<double>(each.rightEqual + each.wrongEqual) / static_cast<double>(each.right + each.wrong);
-        if (each.wrong < fewest || !isEnough(each.wrongEqual, each.wrong) || !isEnough(each.rightEqual, each.right) ||
-            part < best) {
+        const double part = static_cast<double>(each.equal) / static_cast<double>(each.telling);
+        if (each.wrong < fewest || !isEnough(each.equal, each.telling) || part < best) {
             continue;
         }
         if (part > best) {

@@ -136,6 +136,17 @@ Metrics border(Metrics column, Mistake mistake)
     return column;
 }
 
+/// The metrics of an encoder that is known to be in state 0.
+std::array<std::int16_t, rules::stateCount> knownColumn(Mistake mistake)
+{
+    std::array<std::int16_t, rules::stateCount> column{};
+    for (unsigned state = 0; state < column.size(); ++state) {
+        column[state] = mistake == Mistake::knownAs && state != 0 ? rules::wrap16(mistake.number * eighth)
+                                                                  : rules::knownMetric<std::int16_t>(state, INT16_MIN);
+    }
+    return column;
+}
+
 /// The steps by which the end of a window is shifted, where its recursion starts.
 int shiftOfWindow(const rules::Cut& cut, const rules::Window& window, Mistake mistake)
 {
@@ -266,13 +277,12 @@ unsigned Replay::borderSource(bool isForward, unsigned from, Mistake mistake, So
 Replay::Metrics Replay::forwardStart(unsigned pass, unsigned trellisStep, Mistake mistake, Sources& sources) const
 {
     if (trellisStep == 0 && mistake != Mistake::borderUnknown) {
-        Metrics known;
-        for (unsigned state = 0; state < known.size(); ++state) {
-            known[state] = rules::knownMetric<std::int16_t>(state, INT16_MIN);
-        }
-        return known;
+        return knownColumn(mistake);
     }
     const auto last = borderPass(pass, false, mistake);
+    if (!last && mistake == Mistake::startKnown) {
+        return knownColumn(mistake);
+    }
     if (!last || trellisStep == 0) {
         return {};
     }
@@ -297,11 +307,12 @@ Column Replay::forwardColumn(unsigned pass, unsigned trellisStep, Mistake mistak
 std::array<int, 6> Replay::tailValues(unsigned pass, Mistake mistake) const
 {
     const Code& code = mistake == Mistake::tailOfOtherCode ? itsModel.codes[1 - codeOf(pass)] : codeUsed(pass, mistake);
+    const Code& ofParity = mistake == Mistake::parityOfOtherCode ? itsModel.codes[1 - codeOf(pass)] : code;
     std::array<int, 6> values{};
     for (std::size_t i = 0; i < values.size(); ++i) {
         const std::size_t place =
             mistake == Mistake::tailOrder ? tailOrders[static_cast<std::size_t>(mistake.number)].from[i] : i;
-        values[i] = (place % 2 == 0 ? code.systematic : code.parity)[itsModel.cut.K() + place / 2];
+        values[i] = (place % 2 == 0 ? code.systematic : ofParity.parity)[itsModel.cut.K() + place / 2];
     }
     return values;
 }

@@ -189,6 +189,41 @@ TEST(FittedMistakes, TakeTheSimplestFactorThatFits)
     }
 }
 
+/// A value of a signal in all passes, as tables have it.
+void setAll(Values& dump, unsigned signal, unsigned step, std::int16_t value)
+{
+    for (unsigned pass = 0; pass < dump.passes(); ++pass) {
+        dump.set({pass, signal, step}, value);
+    }
+}
+
+TEST(Shifts, AreNotToldByValuesThatAreTheSameEverywhere)
+{
+    const blocks::Block block = blocks::encode(std::vector<int>(40), 0);
+    const Model model =
+        computeModel({block.sys, block.par1, block.par2}, veltra_ip_morvik_v1_0_get_default_generics(), 2, std::cerr);
+    Values dump = model.values;
+    for (unsigned signal = 0; signal < morvik::signalCount; ++signal) {
+        for (unsigned step = 40; step < dump.steps(); ++step) {
+            setAll(dump, signal, step, 0);
+        }
+    }
+    setAll(dump, morvik::signalsOf(Stage::forward).first + 3, 3, -1024);
+    EXPECT_EQ(findShifts(model, dump), std::vector<std::string>());
+}
+
+TEST(FittedMistakes, TellTheMetricsOfKnownStates)
+{
+    const Model model = modelOf(256, 1, 16);
+    Values dump = model.values;
+    for (unsigned state = 1; state < 8; ++state) {
+        setAll(dump, morvik::signalsOf(Stage::forward).first + state, 0, -2048);
+    }
+    const auto found = findingIn(model, dump, Stage::forward);
+    ASSERT_TRUE(found);
+    EXPECT_TRUE(names(*found, "states other than 0 start with -2048, not with -1024 (rule 10)")) << textOf(*found);
+}
+
 TEST(FittedMistakes, TellAConstant)
 {
     const Model model = modelOf(256, 1, 16);
