@@ -71,6 +71,9 @@ void expectWithin(const Port& port, unsigned index, std::int32_t value, int algo
     if (value == unknownValue) {
         throw BadInput(nameOf(port, index) + " has bits that are x or z");
     }
+    if (port.kind == Kind::step) {
+        return;  // its end follows from the block size
+    }
     const Range& range = rangeOf(port.kind);
     const bool hasTable = port.kind != Kind::pending || algorithm == tableAlgorithm;
     const std::int32_t highest = hasTable ? range.highest : 0;

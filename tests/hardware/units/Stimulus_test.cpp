@@ -117,6 +117,7 @@ TEST(UnitPorts, RefuseWhatTheirRegistersCannotHold)
     EXPECT_EQ(refusal(Number::branch, 0, {0}), "branch takes 2 values, not 1");
     EXPECT_EQ(refusal(Number::address, 0, {41, 0}), "block_size 41 is no block size of 3GPP TS 36.212");
     EXPECT_EQ(refusal(Number::address, 0, {40, 40}), "step 40 is not allowed, expected 0 to 39");
+    EXPECT_EQ(refusal(Number::address, 0, {40, -1}), "step -1 is not allowed, expected 0 to 39");
     Values column(20);
     column[3] = -2049;
     EXPECT_EQ(refusal(Number::forward, 0, column), "alpha3 -2049 is not allowed, expected -2048 to 2047");
