@@ -182,9 +182,7 @@ int run(const Options& options)
     if (!options.report.empty()) {
         writePage(options.report, counts);
     }
-    print(options.json      ? jsonOf(counts)
-          : options.missing ? missingText(counts)
-                            : textOf(counts, options.all));
+    print(options.json ? jsonOf(counts) : options.missing ? missingText(counts) : textOf(counts, options.all));
     return counts.missing().empty() ? success : differencesFound;
 }
 

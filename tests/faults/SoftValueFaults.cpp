@@ -388,8 +388,7 @@ class IntrinsicCut : public FaultyDecoder {
     bool calcIntrinsic(unsigned int h) override
     {
         const bool computed = FaultyDecoder::calcIntrinsic(h);
-        std::for_each(
-            itsIntrinsic.begin(), itsIntrinsic.begin() + K(), [](short& value) { value = wrap16(value & ~8); });
+        std::for_each_n(itsIntrinsic.begin(), K(), [](short& value) { value = wrap16(value & ~8); });
         return computed;
     }
 };
