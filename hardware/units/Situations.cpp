@@ -250,26 +250,27 @@ void countPath(const Watched& watched, unsigned bitsBefore, int algorithm, std::
 
 void countRatio(int algorithm, const std::vector<std::int32_t>& inputs, std::vector<Situation>& all)
 {
-    std::array<Watched, 2> ofBits;  // bit 1 first
+    Watched ofOne;
+    Watched ofZero;
     const auto alpha = wordsOf(rowAt<Metrics>(inputs, 0));
     const auto beta = wordsOf(rowAt<Metrics>(inputs, states));
     const auto g = wordsOf(rowAt<Branches>(inputs, std::size_t{2} * states));
     const std::int32_t difference = withRule(algorithm, [&](const auto& rule) {
         using Rule = std::decay_t<decltype(rule)>;
-        Watch<Rule> one(rule, true, See{&ofBits[0]});
-        Watch<Rule> zero(rule, true, See{&ofBits[1]});
+        Watch<Rule> one(rule, true, See{&ofOne});
+        Watch<Rule> zero(rule, true, See{&ofZero});
         one.restart();
         zero.restart();
         return rules::bestPath<1>(one, alpha, beta, g) - rules::bestPath<0>(zero, alpha, beta, g);
     });
     for (unsigned state = 0; state < states; ++state) {
         for (const unsigned bit : {0U, 1U}) {
-            ofBits[0].addSum(std::int32_t{alpha[state]} + beta[rules::successor(state, bit)]);
+            ofOne.addSum(std::int32_t{alpha[state]} + beta[rules::successor(state, bit)]);
         }
     }
-    countPath(ofBits[0], 0, algorithm, all);
-    countPath(ofBits[1], 1, algorithm, all);
-    all[all.size() - 2].counts[0] += ofBits[0].sumWraps || ofBits[1].sumWraps ? 1U : 0U;
+    countPath(ofOne, 0, algorithm, all);
+    countPath(ofZero, 1, algorithm, all);
+    all[all.size() - 2].counts[0] += ofOne.sumWraps || ofZero.sumWraps ? 1U : 0U;
     all.back().counts[0] += rules::wrap16(difference) != difference ? 1U : 0U;
 }
 
