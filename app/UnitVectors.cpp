@@ -10,16 +10,14 @@
 #include "Command.h"
 #include "Lists.h"
 #include "Notice.h"
+#include "base/Checksum.h"
 #include "base/Error.h"
-#include "base/Json.h"
 #include "base/OutputFile.h"
 #include "base/Path.h"
 #include "base/Printable.h"
 #include "base/Text.h"
 #include "hardware/tables/Table.h"
-#include "hardware/units/Situations.h"
-#include "hardware/units/Stimulus.h"
-#include "hardware/vectors/Checksum.h"
+#include "hardware/units/Check.h"
 #include "rules/BlockSizes.h"
 #include "simulation/Plan.h"
 
@@ -27,32 +25,19 @@ namespace morvik {
 
 namespace {
 
-using Json = nlohmann::ordered_json;
+/// Stands for all units.
+constexpr char everyUnit[] = "all";
 
-std::string nameOf(units::Number unit)
+/// What --unit takes.
+std::vector<std::string> unitWords()
 {
-    return units::allUnits()[static_cast<std::size_t>(unit)].name;
-}
-
-std::vector<std::string> unitNames()
-{
-    std::vector<std::string> names;
+    std::vector<std::string> words;
     for (const units::Unit& unit : units::allUnits()) {
-        names.emplace_back(unit.name);
+        words.emplace_back(unit.name);
     }
-    return names;
+    words.emplace_back(everyUnit);
+    return words;
 }
-
-/// What the cases of a unit are, and what they meet.
-struct Made {
-    units::Extent extent;
-    std::vector<units::Situation> situations;
-
-    std::uint64_t cases() const
-    {
-        return extent.directed + extent.random;
-    }
-};
 
 /// The options that units have a use for.
 void expectOptionsOfUnits(const CLI::App& command, const UnitVectors& vectors)
@@ -88,7 +73,22 @@ std::string commandOf(units::Number unit, const UnitVectors& vectors)
     return command;
 }
 
-Made writeTables(units::Number unit, const UnitVectors& vectors)
+/// The formats of a unit's table, when its files are written.
+std::vector<units::DescribedFormat> formatsOf(units::Number unit, const UnitVectors& vectors)
+{
+    const tables::Table table = units::tableOf(unit, vectors.algorithm);
+    std::vector<units::DescribedFormat> formats;
+    for (const std::string& format : vectors.formats) {
+        formats.push_back({format, {}});
+        for (const std::string& name : tables::findFormat(format)->files(table)) {
+            formats.back().files.push_back({name, base::sha256(vectors.folder + '/' + name)});
+        }
+    }
+    return formats;
+}
+
+/// Writes the tables of a unit, and describes them.
+units::Description writeTables(units::Number unit, const UnitVectors& vectors)
 {
     const tables::Table table = units::tableOf(unit, vectors.algorithm);
     std::vector<std::unique_ptr<tables::TableWriter>> writers;
@@ -109,51 +109,25 @@ Made writeTables(units::Number unit, const UnitVectors& vectors)
     for (const auto& writer : writers) {
         writer->finish();
     }
-    return {extent, situations.all()};
+    return {MORVIK_VERSION,
+            commandOf(unit, vectors),
+            unit,
+            vectors.algorithm,
+            extent,
+            situations.all(),
+            formatsOf(unit, vectors)};
 }
 
-Json filesOf(units::Number unit, const UnitVectors& vectors)
+/// "branch: 98048 cases in csv,memh".
+std::string casesText(const units::Description& made)
 {
-    const tables::Table table = units::tableOf(unit, vectors.algorithm);
-    Json files = Json::array();
-    for (const std::string& format : vectors.formats) {
-        for (const std::string& name : tables::findFormat(format)->files(table)) {
-            files.push_back({{"name", name}, {"sha256", vectors::sha256(vectors.folder + '/' + name)}});
-        }
-    }
-    return files;
+    return nameOf(made.unit) + ": " + base::counted(made.cases(), "case") + " in " +
+           listed(made.formats, [](const units::DescribedFormat& format) { return format.name; });
 }
 
-void writeDescription(units::Number unit, const UnitVectors& vectors, const Made& made)
+std::string summaryOf(const units::Description& made)
 {
-    Json json;
-    json["morvik"] = MORVIK_VERSION;
-    json["command"] = commandOf(unit, vectors);
-    json["unit"] = nameOf(unit);
-    json["algorithm"] = simulation::algorithmName(static_cast<unsigned>(vectors.algorithm));
-    json["exhaustive"] = made.extent.isExhaustive;
-    json["cases"] = made.cases();
-    json["directed"] = made.extent.directed;
-    json["random"] = made.extent.random;
-    json["columns"] = Json::array();
-    for (const tables::Column& column : units::tableOf(unit, vectors.algorithm).columns) {
-        json["columns"].push_back({{"name", column.name}, {"bits", column.bits}, {"signed", column.isSigned}});
-    }
-    json["situations"] = Json::array();
-    for (const units::Situation& situation : made.situations) {
-        json["situations"].push_back({{"name", situation.name}, {"count", situation.total()}});
-        if (situation.counts.size() > 1) {
-            json["situations"].back()["in_each_" + situation.place] = situation.counts;
-        }
-    }
-    json["files"] = filesOf(unit, vectors);
-    base::writeFile(vectors.folder + '/' + nameOf(unit) + ".json", json.dump(2) + '\n');
-}
-
-std::string summaryOf(units::Number unit, const UnitVectors& vectors, const Made& made)
-{
-    std::string text = nameOf(unit) + ": " + base::counted(made.cases(), "case") + " in " +
-                       listed(vectors.formats, [](const std::string& format) { return format; });
+    std::string text = casesText(made);
     text += made.extent.isExhaustive ? ", exhaustive\n"
                                      : ": " + std::to_string(made.extent.directed) + " directed, " +
                                            std::to_string(made.extent.random) + " random\n";
@@ -187,14 +161,19 @@ void addUnitOptions(CLI::App& command, UnitVectors& vectors)
 {
     const auto append = [](const std::string& text, std::vector<units::Number>& units) {
         const auto unit = units::findUnit(text);
-        if (!unit) {
-            refuse("--unit", text, "expected " + alternatives(unitNames()));
+        if (!unit && text != everyUnit) {
+            refuse("--unit", text, "expected " + alternatives(unitWords()));
         }
-        units.push_back(*unit);
+        for (std::size_t number = 0; number < units::allUnits().size(); ++number) {
+            const auto each = static_cast<units::Number>(number);
+            if (!unit || *unit == each) {
+                units.push_back(each);
+            }
+        }
     };
     CLI::Option* const unit =
         addListOption(command, "--unit", vectors.units, append, "Instead of blocks: cases for single units of the core")
-            ->check(offer(unitNames()))
+            ->check(offer(unitWords()))
             ->type_name("NAME[,NAME...]");
     command.add_option("--cases", vectors.randomCases, "Random cases of each unit beside the directed ones")
         ->transform(integerFrom(0, 10000000))
@@ -215,12 +194,31 @@ int makeUnitVectors(const CLI::App& command, UnitVectors vectors)
     std::string text = base::visible(vectors.folder) + ": for the algorithm " +
                        simulation::algorithmName(static_cast<unsigned>(vectors.algorithm)) + '\n';
     for (const units::Number unit : vectors.units) {
-        const Made made = writeTables(unit, vectors);
-        writeDescription(unit, vectors, made);
-        text += summaryOf(unit, vectors, made);
+        const units::Description made = writeTables(unit, vectors);
+        base::writeFile(vectors.folder + '/' + descriptionName(unit), textOf(made));
+        text += summaryOf(made);
     }
     print(text);
     return success;
+}
+
+int checkUnitVectors(const std::string& folder)
+{
+    int status = success;
+    std::string text;
+    for (const units::Number unit : units::unitsIn(folder)) {
+        const units::CheckedUnit checked = units::checkUnit(folder, unit);
+        base::expectOwnFile(base::standardStream, units::filesOf(folder, checked.description), "findings");
+        text += base::visible(folder) + ": " + casesText(checked.description);
+        if (checked.difference) {
+            text += ": " + *checked.difference + '\n';
+            status = differencesFound;
+        } else {
+            text += ", all as the model computes them\n";
+        }
+    }
+    print(text);
+    return status;
 }
 
 }  // namespace morvik

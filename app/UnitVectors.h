@@ -28,6 +28,10 @@ void addUnitOptions(CLI::App& command, UnitVectors& vectors);
 /// other options of the command that units have no use for. Returns the exit status.
 int makeUnitVectors(const CLI::App& command, UnitVectors vectors);
 
+/// Computes the tables of all units that the folder describes again, and prints what differs. Throws base::Error for
+/// files that are damaged. Returns the exit status.
+int checkUnitVectors(const std::string& folder);
+
 }  // namespace morvik
 
 #endif

@@ -1,9 +1,12 @@
 // Vectors: the subcommand that generates stimulus and expected values for a test bench.
 #include "Vectors.h"
 
+#include <algorithm>
+#include <filesystem>
 #include <memory>
 #include <optional>
 #include <string>
+#include <system_error>
 #include <vector>
 
 #include "Arguments.h"
@@ -20,6 +23,7 @@
 #include "base/Thousandths.h"
 #include "ber/LinkOptions.h"
 #include "coverage/CoverOptions.h"
+#include "hardware/units/Check.h"
 #include "hardware/vectors/Set.h"
 #include "link/coding/CodeBlocks.h"
 #include "simulation/Plan.h"
@@ -169,7 +173,7 @@ int make(Options options)
     return isCovered ? success : differencesFound;
 }
 
-int check(const std::string& path)
+int checkSet(const std::string& path)
 {
     const vectors::CheckedSet set = vectors::checkSet(path);
     base::expectOwnFile(base::standardStream, vectors::filesOf(path, set.manifest), "findings");
@@ -182,6 +186,16 @@ int check(const std::string& path)
     print(opening + blocksAndFormats(set.manifest) + ", all as the model decodes them: " + comparedText(set.compared) +
           '\n');
     return success;
+}
+
+/// Checks the set of a folder, its tables of units, or both.
+int check(const std::string& path)
+{
+    const bool hasUnits = !units::unitsIn(path).empty();
+    std::error_code ignored;  // checkSet() tells what is wrong
+    const bool hasSet = std::filesystem::exists(std::filesystem::path(path) / vectors::manifestName, ignored);
+    const int ofSet = hasSet || !hasUnits ? checkSet(path) : success;
+    return hasUnits ? std::max(ofSet, checkUnitVectors(path)) : ofSet;
 }
 
 int makeUnits(const CLI::App& command, const Options& options)
@@ -329,7 +343,7 @@ Command addVectors(CLI::App& app)
         command
             ->add_option("--out", options->output, "Write a new set of vectors to this folder; replaces an earlier one")
             ->type_name("DIR");
-    command->add_option("--check", options->checked, "Decode the vectors in this folder again, and compare")
+    command->add_option("--check", options->checked, "Decode or compute what is in this folder again, and compare")
         ->type_name("DIR")
         ->excludes(output);
     addBlockOptions(*command, *options);

@@ -429,4 +429,16 @@ tables::Row rowOf(Number unit,
     return row;
 }
 
+std::vector<std::int32_t> inputsOf(Number unit, int algorithm, const tables::Row& row)
+{
+    std::vector<std::int32_t> inputs;
+    auto next = row.begin();
+    for (const Port& port : allUnits()[static_cast<std::size_t>(unit)].inputs) {
+        for (unsigned i = 0; i < port.count; ++i) {
+            inputs.push_back(isInTable(port, algorithm) ? static_cast<std::int32_t>(*next++) : 0);
+        }
+    }
+    return inputs;
+}
+
 }  // namespace morvik::units

@@ -39,6 +39,9 @@ tables::Row rowOf(Number unit,
                   const std::vector<std::int32_t>& inputs,
                   const std::vector<std::int32_t>& outputs);
 
+/// The inputs of a row of the table.
+std::vector<std::int32_t> inputsOf(Number unit, int algorithm, const tables::Row& row);
+
 }  // namespace morvik::units
 
 #endif

@@ -6,11 +6,11 @@
 #include <set>
 
 #include "Blocks.h"
-#include "Checksum.h"
 #include "Core.h"
 #include "Cover.h"
 #include "Received.h"
 #include "SetFolder.h"
+#include "base/Checksum.h"
 #include "base/Error.h"
 #include "base/OutputFile.h"
 #include "base/Path.h"
@@ -239,7 +239,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
 {
     for (const ManifestFile& file : format.files) {
         const std::string path = pathOf(folder, file.name);
-        if (sha256(path) != file.sha256) {
+        if (base::sha256(path) != file.sha256) {
             throw base::Error(path + ": has changed since it was written: its sha256 differs from the manifest");
         }
     }
@@ -307,7 +307,7 @@ Manifest makeSet(const std::string& folder, Manifest manifest, coverage::Counts*
         ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
         for (const KeptTable& kept : format.tables) {
             for (const std::string& name : tables::findFormat(format.name)->files(kept.table)) {
-                format.files.push_back({name, sha256(pathOf(set.aside(), name))});
+                format.files.push_back({name, base::sha256(pathOf(set.aside(), name))});
             }
         }
         manifest.formats.push_back(format);

@@ -4,6 +4,7 @@
 #include <sstream>
 #include <string>
 
+#include "base/Checksum.h"
 #include "support/CommandTest.h"
 
 namespace {
@@ -25,6 +26,26 @@ protected:
         EXPECT_EQ(result.status, 2);
         EXPECT_EQ(result.out, "");
         EXPECT_EQ(result.err, "morvik vectors: " + message + '\n');
+    }
+
+    /// Replaces the last field of a line, counted from 0, and the file's digest in its description.
+    void replaceWithChecksum(const std::string& file,
+                             const std::string& description,
+                             unsigned line,
+                             const std::string& value) const
+    {
+        const std::string before = morvik::base::sha256(morvik.directory() + '/' + file);
+        std::istringstream lines(morvik.read(file));
+        std::string changed;
+        std::string text;
+        for (unsigned i = 0; std::getline(lines, text); ++i) {
+            changed += (i == line ? text.substr(0, text.rfind(',') + 1) + value : text) + '\n';
+        }
+        morvik.write(file, changed);
+        const std::string place = file.substr(0, file.rfind('/') + 1) + description;
+        std::string digests = morvik.read(place);
+        digests.replace(digests.find(before), before.size(), morvik::base::sha256(morvik.directory() + '/' + file));
+        morvik.write(place, digests);
     }
 };
 
@@ -201,12 +222,77 @@ TEST_F(Vectors, MakesCasesForUnitsWithoutPendingCorrections)
     EXPECT_EQ(addresses.substr(0, 54), "block,block_size,step,address\n0,48,0,0\n0,48,1,19\n0,48,");
 }
 
+TEST_F(Vectors, ChecksCasesOfUnits)
+{
+    vectors({"--unit", "all", "--out", "u", "--cases", "1", "--block-size", "40", "--format", "csv,c,npy"});
+    const CommandResult checked = vectors({"--check", "u"});
+    EXPECT_EQ(checked.status, 0) << checked.err;
+    EXPECT_EQ(std::count(checked.out.begin(), checked.out.end(), '\n'), 9);
+    EXPECT_EQ(checked.out.rfind("u: intrinsic: 65536 cases in c,csv,npy, all as the model computes them\n", 0), 0U)
+        << checked.out;
+    // A set in the same folder is checked, too.
+    vectors({"--unit", "tail", "--out", "both", "--cases", "0", "--algorithm", "table"});
+    morvik.write("both/manifest.json", "{}");
+    EXPECT_EQ(vectors({"--check", "both"}).err, "morvik vectors: both/manifest.json: lacks \"version\"\n");
+}
+
+TEST_F(Vectors, FindsWrongCasesOfUnits)
+{
+    const auto make = [this] {
+        vectors({"--unit", "forward", "--out", "u", "--cases", "1", "--algorithm", "table", "--format", "csv"});
+    };
+    make();
+    replaceWithChecksum("u/forward.csv", "forward.json", 4, "7");
+    const CommandResult wrong = vectors({"--check", "u"});
+    EXPECT_EQ(wrong.status, 1) << wrong.err;
+    EXPECT_EQ(wrong.out.rfind("u: forward: 5185 cases in csv: csv, case 3: next_pending7 is ", 0), 0U) << wrong.out;
+    EXPECT_NE(wrong.out.find(", forward says 7\n"), std::string::npos) << wrong.out;
+    make();
+    morvik.write("u/forward.csv", morvik.read("u/forward.csv") + "0\n");
+    expectRefused({"--check", "u"},
+                  "u/forward.csv: has changed since it was written: its sha256 differs from forward.json");
+    make();
+    morvik.write("u/forward.memh", "");
+    expectRefused({"--check", "u"}, "u/forward.memh: is not a file that forward.json names, and cannot be checked");
+}
+
+TEST_F(Vectors, RefusesDescriptionsOfUnitsThatTellOtherCases)
+{
+    vectors({"--unit", "border", "--out", "u", "--format", "csv"});
+    const std::string right = morvik.read("u/border.json");
+    const auto expect = [&](const char* name, const nlohmann::json& value, const std::string& message) {
+        auto json = nlohmann::json::parse(right);
+        json[name] = value;
+        morvik.write("u/border.json", json.dump());
+        expectRefused({"--check", "u"}, "u/border.json: " + message);
+    };
+    auto json = nlohmann::json::parse(right);
+    json["cases"] = 4095;
+    json["directed"] = 4095;
+    morvik.write("u/border.json", json.dump());
+    expectRefused({"--check", "u"}, "u/border.json: tells 4095 cases, csv has 4096");
+    json = nlohmann::json::parse(right);
+    json["situations"][0]["count"] = json["situations"][0]["count"].get<unsigned>() + 1;
+    auto& places = json["situations"][0]["in_each_state"];
+    places[2] = places[2].get<unsigned>() + 1;
+    expect("situations", json["situations"], "has another count of \"low bits cleared\" than the cases in csv");
+    expect("unit", "tail", "\"unit\" is \"tail\", expected border");
+    expect("cases", 4095, "\"cases\" is 4095, expected directed and random ones, or exhaustive directed ones");
+    expect("columns", nlohmann::json::array(), "\"columns\" is a list, expected those of the unit");
+    expect("files", nlohmann::json::array(), "\"files\" is a list, expected at least one");
+    expect("files",
+           {{{"name", "../border.csv"}, {"sha256", ""}}},
+           "file 0 \"../border.csv\" begins no further format of the unit");
+    morvik.write("u/border.json", right.substr(0, 100));
+    EXPECT_EQ(vectors({"--check", "u"}).status, 2);
+}
+
 TEST_F(Vectors, RefusesWhatUnitsHaveNoUseFor)
 {
     const std::string help = "; see 'morvik vectors --help'";
     expectRefused({"--unit", "gamma", "--out", "u"},
                   "--unit: \"gamma\" is not allowed, expected intrinsic, branch, forward, backward, ratio, extrinsic, "
-                  "address, tail or border" +
+                  "address, tail, border or all" +
                       help);
     expectRefused({"--unit", "branch"}, "--unit requires --out");
     expectRefused({"--unit", "branch", "--out", "u", "--num-pu", "4"},

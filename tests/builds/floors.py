@@ -29,7 +29,7 @@ BELOW = {
     "hardware/trace": "base hardware/tables hardware/testbench rules",
     "hardware/comparison": "base hardware/testbench rules src",
     "hardware/coverage": "base hardware/comparison hardware/testbench rules",
-    "hardware/units": "hardware/tables hardware/testbench rules",
+    "hardware/units": "base hardware/tables hardware/testbench rules",
     "hardware/checker": "base hardware/comparison hardware/coverage hardware/testbench rules",
     "hardware/diagnosis": "base hardware/testbench link/coding rules simulation",
     "hardware/diagnosis/chain": "base hardware/diagnosis hardware/testbench link link/coding link/modulation rules simulation",

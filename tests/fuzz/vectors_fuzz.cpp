@@ -1,5 +1,5 @@
-// vectors_fuzz: the readers of sets of vectors take any files: the manifest, the tables in every format, and counts of
-// situations.
+// vectors_fuzz: the readers of sets of vectors take any files: the manifest, the tables in every format, counts of
+// situations, and descriptions of units.
 #include <filesystem>
 #include <sstream>
 
@@ -7,6 +7,7 @@
 #include "TemporaryFiles.h"
 #include "base/Error.h"
 #include "hardware/coverage/Counts.h"
+#include "hardware/units/Description.h"
 #include "hardware/vectors/BlockFiles.h"
 #include "hardware/vectors/Manifest.h"
 
@@ -27,6 +28,21 @@ void readManifestText(const std::string& text)
         }
     } catch (const morvik::base::Error& error) {
         requireOneLine(error, "in");
+    }
+}
+
+/// As that of each unit.
+void readDescription(const std::string& text)
+{
+    using namespace morvik::units;
+    for (std::size_t number = 0; number < allUnits().size(); ++number) {
+        const auto unit = static_cast<Number>(number);
+        try {
+            const std::string read = textOf(parseDescription(text, "in", unit));
+            require(textOf(parseDescription(read, "in", unit)) == read, "what was read is written, and read again");
+        } catch (const morvik::base::Error& error) {
+            requireOneLine(error, "in");
+        }
     }
 }
 
@@ -83,9 +99,12 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
     FuzzInput input(data, size);
     switch (input.below(3)) {
-    case 0:
-        readManifestText(input.text());
+    case 0: {
+        const std::string text = input.text();
+        readManifestText(text);
+        readDescription(text);
         break;
+    }
     case 1:
         readBlocks(input);
         break;

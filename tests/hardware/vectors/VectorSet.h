@@ -11,19 +11,19 @@
 #include <string>
 #include <vector>
 
+#include "base/Checksum.h"
 #include "base/Error.h"
-#include "hardware/vectors/Checksum.h"
 #include "hardware/vectors/Set.h"
 #include "simulation/Plan.h"
 #include "support/TemporaryFolder.h"
 
 namespace morvik::support {
 
+using morvik::base::sha256;
 using morvik::vectors::checkSet;
 using morvik::vectors::makeSet;
 using morvik::vectors::Manifest;
 using morvik::vectors::Settings;
-using morvik::vectors::sha256;
 
 /// Transport blocks in this format, at an Es/N0 in thousandths of a decibel.
 inline simulation::Point transportPoint(const simulation::LinkFormat& format, int milliEsn0)

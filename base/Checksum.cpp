@@ -9,11 +9,11 @@
 #include <string>
 #include <tuple>
 
-#include "base/Error.h"
-#include "base/InputFile.h"
-#include "base/TextFile.h"
+#include "Error.h"
+#include "InputFile.h"
+#include "TextFile.h"
 
-namespace morvik::vectors {
+namespace morvik::base {
 
 namespace {
 
@@ -111,8 +111,8 @@ std::string digits(const Hash& hash)
 
 std::string sha256(const std::string& fileName)
 {
-    base::expectRegularFile(fileName);
-    std::ifstream file = base::openFile(fileName);
+    expectRegularFile(fileName);
+    std::ifstream file = openFile(fileName);
     Hash hash = initialHash;
     Block block{};
     std::uint64_t bytes = 0;
@@ -121,11 +121,11 @@ std::string sha256(const std::string& fileName)
         bytes += block.size();
     }
     if (file.bad()) {
-        throw base::fileError(fileName, "read");
+        throw fileError(fileName, "read");
     }
     const auto rest = static_cast<std::size_t>(file.gcount());
     finish(hash, block, rest, bytes + rest);
     return digits(hash);
 }
 
-}  // namespace morvik::vectors
+}  // namespace morvik::base
