@@ -345,7 +345,7 @@ int reportBlock(const std::vector<vpiHandle>& arguments)
         return standing;
     }
     if (!mayBePartial) {
-        report("ERROR", "ERROR:checker:Values are missing");
+        report("ERROR", "ERROR:checker:Values are missing; set partial if that is intended");
     }
     return mayBePartial ? MORVIK_CHECKER_AGREES : standing;
 }

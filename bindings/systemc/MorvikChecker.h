@@ -126,7 +126,7 @@ public:
             return standing;
         }
         if (!isPartial) {
-            SC_REPORT_ERROR("morvik", "ERROR:checker:Values are missing");
+            SC_REPORT_ERROR("morvik", "ERROR:checker:Values are missing; set partial if that is intended");
         }
         return isPartial ? MORVIK_CHECKER_AGREES : standing;
     }

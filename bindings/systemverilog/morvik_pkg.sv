@@ -338,7 +338,7 @@ package morvik_pkg;
                 answer = CHECKER_AGREES;
             void'(answered(answer));
             if (answer == CHECKER_INCOMPLETE)
-                add_message("ERROR:checker:Values are missing");
+                add_message("ERROR:checker:Values are missing; set partial if that is intended");
             return answer;
         endfunction
 

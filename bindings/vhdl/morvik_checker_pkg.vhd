@@ -306,7 +306,7 @@ package body morvik_checker_pkg is
         if result = morvik_incomplete and partial then
             result := morvik_agrees;
         elsif result = morvik_incomplete then
-            morvik_report_line("ERROR:checker:Values are missing");
+            morvik_report_line("ERROR:checker:Values are missing; set partial if that is intended");
         end if;
         pass_on(checker, result);
         standing := result;

@@ -86,7 +86,7 @@ std::optional<Stage> stageNamed(const Words& words, unsigned highestNumber, unsi
 {
     static const std::array<std::pair<Stage, Words>, 6> names = {
         {{Stage::extrinsic, {"extrinsic", "ext", "extr", "le", "lext"}},
-         {Stage::intrinsic, {"intrinsic", "int", "intr", "apriori", "prior", "la"}},
+         {Stage::intrinsic, {"intrinsic", "int", "intr"}},
          {Stage::forward, {"alpha", "am", "fm", "fwd", "forward", "fsm"}},
          {Stage::backward, {"beta", "bwd", "backward", "bsm"}},
          {Stage::branch, {"gamma", "branch", "g", "bmu", "gm"}},

@@ -136,7 +136,7 @@ module wrong_use_tb;
         expect_answer(check, check.standing(), CHECKER_INCOMPLETE,
             "ERROR:checker:Half-iteration 16 is not allowed, expected 0 to 15");
         expect_answer(check, check.report(1), CHECKER_AGREES, "");
-        expect_answer(check, check.report(), CHECKER_INCOMPLETE, "ERROR:checker:Values are missing");
+        expect_answer(check, check.report(), CHECKER_INCOMPLETE, "ERROR:checker:Values are missing; set partial if that is intended");
         expect_answer(check, check.write_situations("/nowhere/met.csv"), CHECKER_REFUSED,
             "ERROR:checker:Situations are counted only if count_situations asks for it");
         check.count_situations();

@@ -312,11 +312,12 @@ TEST(SuggestedMap, PlacesTheUsualNamesOfAWaveform)
         "$var wire 13 s trellis_step_q $end\n$var wire 96 a alpha_vec [95:0] $end\n"
         "$var wire 12 b bwd_metric_3_q [11:0] $end\n$var wire 9 d bwd_metric_7_q $end\n"
         "$var wire 12 g bm[1] $end\n$var wire 12 e leOut $end\n$var wire 1 c clk $end\n"
-        "$var wire 12 l llr $end\n$var wire 200 x extrinsic_mem $end\n",
+        "$var wire 12 l llr $end\n$var wire 200 x extrinsic_mem $end\n$var wire 8 y apriori $end\n",
         "#0\nb0 h\nb1 s\nb11000000000010 a\nb101 b\nb111 g\nb1 e\nb10 l\nb1 d\n");
     std::istringstream input(text);
     const SuggestedMap map = suggestMap(namesOfVcd(input, "dump"));
-    EXPECT_EQ(map.notes, (std::vector<std::string>{"not placed: clk", "not placed: extrinsic_mem"}));
+    EXPECT_EQ(map.notes,
+              (std::vector<std::string>{"not placed: apriori", "not placed: clk", "not placed: extrinsic_mem"}));
     const Dump dump = read(readVcd, text, mapOf(map.json));
     EXPECT_EQ(dump.values.at({0, alpha0, 1}), 2);
     EXPECT_EQ(dump.values.at({0, alpha0 + 1, 1}), 3);

@@ -162,7 +162,8 @@ package decoder_env_pkg;
     class block_checkers;
         int unsigned seen, computed;  // values of the core in finished blocks: those observed, and all
         local int units, kind;
-        local morvik_checker resting[$];
+        local bit is_counting;
+        local morvik_checker all[$], resting[$];
         local morvik_checker busy[int unsigned];  // by tag
 
         function new(int num_pu = 2, int algorithm = ALGORITHM_SCALED);
@@ -178,9 +179,29 @@ package decoder_env_pkg;
             else if (resting.size() > 0)
                 check = resting.pop_front();
             else
-                check = new(units, kind);
+                check = another();
             void'(check.start(block.sys, block.par1, block.par2, block.iterations));
             busy[block.tag] = check;
+        endfunction
+
+        local function morvik_checker another();
+            morvik_checker check;
+            check = new(units, kind);
+            if (is_counting)
+                check.count_situations();
+            all.push_back(check);
+            return check;
+        endfunction
+
+        // Counts the situations of the arithmetic that observed values show, if it is called before the first block.
+        function void count_situations();
+            is_counting = 1;
+        endfunction
+
+        // Writes the counts of each checker: to NAME_0.csv, NAME_1.csv and so on.
+        function void write_situations(string name);
+            foreach (all[i])
+                void'(all[i].write_situations($sformatf("%s_%0d.csv", name, i)));
         endfunction
 
         // The checker of a block in flight, or null.

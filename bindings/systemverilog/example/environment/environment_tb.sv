@@ -1,7 +1,8 @@
 // environment_tb: a test bench around core_stand_in with the classes of decoder_env_pkg. Its drivers and monitors are what the
 // agents of a UVM environment do.
 //
-//     +blocks=N    how many, by default 12; core_stand_in.sv has more arguments
+//     +blocks=N           how many, by default 12; core_stand_in.sv has more arguments
+//     +situations=NAME    counts the situations of the arithmetic that ratios show, in NAME_0.csv, NAME_1.csv and so on
 module environment_tb;
     import morvik_pkg::*;
     import decoder_env_pkg::*;
@@ -25,6 +26,7 @@ module environment_tb;
     block_checkers checkers;
     int unsigned random = 1;
     int blocks = 12;
+    string situations;
 
     initial forever #5 clk = !clk;
 
@@ -108,6 +110,8 @@ module environment_tb;
         predict = new(num_pu);
         board = new($test$plusargs("out_of_order") == 0);
         checkers = new(num_pu);
+        if ($value$plusargs("situations=%s", situations) != 0)
+            checkers.count_situations();
         fork
             watch();
         join_none
@@ -115,6 +119,8 @@ module environment_tb;
         board.finish();
         $display("%s", board.summary());
         $display("%s, %0d errors", checkers.summary(), reporter.errors);
+        if (situations != "")
+            checkers.write_situations(situations);
         if (!board.passed() || checkers.seen == 0 || reporter.errors > 0)
             $fatal(1, "failed");
         $display("passed");
