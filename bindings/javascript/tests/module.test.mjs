@@ -131,12 +131,13 @@ test("the automatic scale is the command's", () => {
     assert.equal(vectors.scaleOf({blockSize: 512, ebn0: 1, algorithm: 2}), Number(row.scale));
 });
 
-test("the installed package runs the examples of the document", () => {
+test("the installed package runs the examples of its documents", () => {
     const file = readdirSync(dirname(place)).find(name => name.endsWith(".tgz"));
     execFileSync("npm", ["install", "--offline", "--no-audit", "--no-fund", "--silent", join(dirname(place), file)], {cwd: folder});
-    const text = readFileSync(new URL("../../../docs/browser.md", import.meta.url), "utf8");
+    const documents = ["../../../docs/browser.md", "../package/README.md"];
+    const text = documents.map(name => readFileSync(new URL(name, import.meta.url), "utf8")).join("");
     const examples = Array.from(text.matchAll(/^```js\n(.*?)^```/gms), found => found[1]);
-    assert.equal(examples.length, 2);
+    assert.equal(examples.length, 3);
     for (const example of examples) {
         writeFileSync(join(folder, "example.mjs"), example);
         const [, expected] = /\/\/ prints: (.*)/.exec(example);
