@@ -8,12 +8,13 @@
 #include <array>
 #include <cstdint>
 
+#include "Precise.h"
 #include "link/random/AliasTable.h"
 
 namespace morvik::link {
 
 /// The noise's standard deviation for amplitude 1. Eb/N0 includes the tail's energy: the rate is K / (3 K + 12).
-long double noiseDeviation(unsigned K, int milliDecibels);
+Precise noiseDeviation(unsigned K, int milliDecibels);
 
 /// The distribution of the rounded value r of a bit sent as 1. That of a 0 is the distribution of -r.
 struct RoundedDistribution {
@@ -28,7 +29,7 @@ struct RoundedDistribution {
 };
 
 /// `scale` above 0.
-RoundedDistribution roundedDistribution(long double deviation, long double scale);
+RoundedDistribution roundedDistribution(const Precise& deviation, double scale);
 
 /// A soft value, and whether it was clipped.
 struct SoftValue {

@@ -13,8 +13,8 @@ double defaultScale(int algorithmType, unsigned K, int milliDecibels)
     }
     // A soft value s adds +s to a metric for a bit 1 and -s for a bit 0, so the logarithms of their probabilities
     // differ by 2 s. For a received value y and noise of variance v they differ by 2 y / v.
-    const long double deviation = noiseDeviation(K, milliDecibels);
-    return static_cast<double>(one / (deviation * deviation));
+    const Precise deviation = noiseDeviation(K, milliDecibels);
+    return static_cast<double>(Precise(one) / (deviation * deviation));
 }
 
 }  // namespace morvik::link

@@ -6,7 +6,6 @@
 #include <cmath>
 #include <numeric>
 
-#include "link/channel/WideMath.h"
 
 namespace {
 
@@ -62,7 +61,7 @@ TEST(Channel, ProbabilitiesAreThoseOfTheDensity)
 {
     for (const double scale : {2.0, 8.0, 40.0}) {
         const double deviation = 0.9;
-        const RoundedDistribution distribution = roundedDistribution(0.9L, scale);
+        const RoundedDistribution distribution = roundedDistribution(0.9, scale);
         const auto border = [&](double r) {
             return (r / scale - 1) / deviation;
         };
@@ -78,7 +77,7 @@ TEST(Channel, TheEndsAreDividedUp)
 {
     constexpr double scale = 100;
     const double deviation = 0.8;
-    const RoundedDistribution distribution = roundedDistribution(0.8L, scale);
+    const RoundedDistribution distribution = roundedDistribution(0.8, scale);
     const auto border = [&](double r) {
         return (r / scale - 1) / deviation;
     };
@@ -95,11 +94,30 @@ TEST(Channel, TheEndsAreDividedUp)
 
 TEST(Channel, EndsThatAreNeverReachedAreNotDivided)
 {
-    const RoundedDistribution distribution = roundedDistribution(0.001L, 8);
+    const RoundedDistribution distribution = roundedDistribution(0.001, 8);
     EXPECT_EQ(distribution.weights[8], whole);
     EXPECT_EQ(distribution.top[0], std::uint64_t{1} << 32);
     EXPECT_EQ(distribution.top[1], std::uint64_t{1} << 32);
     EXPECT_EQ(distribution.bottom, std::uint64_t{1} << 32);
+}
+
+// The same on every machine, as the frames of a simulation are.
+TEST(Channel, WeightsAreThePromisedOnes)
+{
+    std::uint64_t digest = 0xCBF29CE484222325;  // FNV-1a over words
+    for (const unsigned K : {40U, 512U, 6144U}) {
+        for (int milliDecibels = -3000; milliDecibels <= 12000; milliDecibels += 500) {
+            const Precise deviation = noiseDeviation(K, milliDecibels);
+            const auto matching = static_cast<double>(Precise(8) / (deviation * deviation));
+            for (const double scale : {8.0, matching}) {
+                const RoundedDistribution distribution = roundedDistribution(deviation, scale);
+                for (const std::uint64_t weight : distribution.weights) {
+                    digest = (digest ^ weight) * 0x100000001B3;
+                }
+            }
+        }
+    }
+    EXPECT_EQ(digest, 0xFFAAE0F35232AE97U);
 }
 
 TEST(Channel, ClipsToEightBits)
@@ -109,24 +127,4 @@ TEST(Channel, ClipsToEightBits)
         EXPECT_EQ(soft.value, rounded < -128 ? -128 : rounded > 127 ? 127 : rounded);
         EXPECT_EQ(soft.clipped, soft.value != rounded);
     }
-}
-
-TEST(WideMath, SeriesGiveWhatAWideLibraryGives)
-{
-    // Within some units of the last place of 64 bits; the sum of a tail and its complement keeps what is absolute.
-    constexpr long double unit = 0x1p-63L;
-    for (int i = -400; i <= 4000; ++i) {
-        const long double x = i / 64.0L;
-        const long double expected = std::erfc(x);
-        const long double lost = x > 0 && x < 3 ? unit : 0;  // 1 - erf
-        EXPECT_LE(std::fabs(series::erfc(x) - expected), (8 + x * x) * unit * expected + 16 * lost)
-            << "x = " << i << " / 64";
-    }
-    for (int milliDecibels = -50000; milliDecibels <= 50000; milliDecibels += 37) {
-        const long double x = milliDecibels / 10000.0L;
-        const long double expected = std::pow(10.0L, x);
-        EXPECT_LE(std::fabs(series::powerOfTen(x) - expected), 16 * unit * expected) << milliDecibels;
-    }
-    EXPECT_EQ(series::exponential(0), 1);
-    EXPECT_EQ(series::erfc(0), 1);
 }
