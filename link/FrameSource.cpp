@@ -3,11 +3,11 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstring>
 #include <stdexcept>
 #include <string>
 
 #include "link/channel/Channel.h"
+#include "link/coding/PackedBits.h"
 #include "link/random/GaussianNumber.h"
 #include "rules/Tail.h"
 
@@ -29,18 +29,6 @@ double checkedScale(double scale)
         throw std::invalid_argument("a scale of " + std::to_string(scale));
     }
     return scale;
-}
-
-/// Spreads packed bits over bytes of 0 and 1.
-void unpack(const std::uint64_t* block, unsigned K, std::uint8_t* bits)
-{
-    constexpr std::uint64_t everyByte = 0x0101010101010101;
-    for (unsigned k = 0; k < K; k += 8) {
-        // Byte j keeps bit j of the eight; adding 127 moves it to the top, whichever it was.
-        const std::uint64_t eight = (block[k / 64] >> k % 64 & 0xFF) * everyByte & 0x8040201008040201;
-        const std::uint64_t bytes = (eight + 0x7F * everyByte) >> 7 & everyByte;
-        std::memcpy(bits + k, &bytes, sizeof bytes);
-    }
 }
 
 }  // namespace
@@ -105,7 +93,7 @@ void FrameSource::drawInformation(std::uint64_t first, unsigned count)
 void FrameSource::receive(std::uint64_t first, unsigned count, std::size_t place, Frames& frames)
 {
     for (unsigned i = 0; i < count; ++i) {
-        unpack(itsInformation.block(i), itsK, &frames.sent[(place + i) * itsK]);
+        unpackBits(itsInformation.block(i), itsK, &frames.sent[(place + i) * itsK]);
         frames.clipped[place + i] = 0;
         if (itsNoise == Noise::discrete) {
             receiveDiscrete(randomOf(first + i), i, place + i, frames);

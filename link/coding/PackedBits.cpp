@@ -10,11 +10,22 @@ namespace {
 
 constexpr std::uint64_t everyByte = 0x0101010101010101;
 
+/// A word of memory whose first byte is the lowest, and back, whatever the machine's order.
+std::uint64_t lowestFirst(std::uint64_t word)
+{
+#if __BYTE_ORDER__ == __ORDER_BIG_ENDIAN__
+    return __builtin_bswap64(word);
+#else
+    return word;
+#endif
+}
+
 /// Bit j of the result is the lowest bit of byte j.
 std::uint64_t packEight(const std::uint8_t* bytes)
 {
     std::uint64_t eight;
     std::memcpy(&eight, bytes, sizeof eight);
+    eight = lowestFirst(eight);
     // Byte j moves to bit 56 + j; the other products stay below bit 56 or leave the word.
     return (eight & everyByte) * 0x0102040810204080 >> 56;
 }
@@ -71,7 +82,7 @@ void unpackBits(const std::uint64_t* row, std::size_t count, std::uint8_t* bytes
 {
     const std::size_t whole = count / 8 * 8;
     for (std::size_t i = 0; i < whole; i += 8) {
-        const std::uint64_t eight = spreadEight(row[i / 64] >> i % 64);
+        const std::uint64_t eight = lowestFirst(spreadEight(row[i / 64] >> i % 64));
         std::memcpy(bytes + i, &eight, sizeof eight);
     }
     for (std::size_t i = whole; i < count; ++i) {
