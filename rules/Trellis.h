@@ -166,7 +166,10 @@ MORVIK_INLINE constexpr Value bestPath(const Decision& rule,
             rule.decide(rule.metric(addWrap(a[odd], b[afterOdd])), rule.metric(addWrap(a[even], b[afterEven])));
         pair[i] = bit != 0 ? rule.add(best, g[i]) : rule.subtract(best, g[i]);
     });
-    return rule.settled(rule.decide(rule.decide(pair[0], pair[1]), rule.decide(pair[2], pair[3])));
+    // In this order with every compiler, for rules that keep what they meet.
+    const auto lower = rule.decide(pair[0], pair[1]);
+    const auto upper = rule.decide(pair[2], pair[3]);
+    return rule.settled(rule.decide(lower, upper));
 }
 
 /// The log-likelihood ratio of a step; positive favours bit 1. Wraps like the metrics (rule 8).
