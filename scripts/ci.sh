@@ -2,7 +2,7 @@
 # Runs the stages of continuous integration locally, all or the named ones.
 #   ci.sh [STAGE...]
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew archives browser browser-short lint-short memory-short mutate packages starts windows
+# named: abi-renew archives browser browser-short lint-short machines machines-short memory-short mutate packages starts windows
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -121,7 +121,7 @@ stage_memory-short() {
     local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Faults/FaultyCore|Stages/Mistakes|Coverage\.IsWholeInASet"
     long+='|Self(Test|Check\.(FindsTheLibraryRight|Notices(TheLast|Another|Other)))|VcdDump\.RefusesTimesWithoutAnEnd'
     long+='|Sizes/ModelValues\.FollowFromEachOther/(2560|6144)$'
-    local scripts='example_sweep|core_from_document|default_core'
+    local scripts='example_sweep|core_from_document|default_core|same_files'
     memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"
 }
 
@@ -238,6 +238,26 @@ stage_archives() {
     done
 }
 
+# Runs only when named: all tests on machines of other processors, in an emulator.
+stage_machines() {
+    local preset
+    scripts/setup --machines
+    for preset in aarch64 s390x; do
+        scripts/build "$preset"
+        scripts/run-tests "$preset"
+    done
+}
+
+# Digests, files, and the tests of what differs between machines: vectors, the order of bytes, floats.
+stage_machines-short() {
+    local preset tests=(digest link_coding_test FrameSource_test)
+    scripts/setup --machines
+    for preset in aarch64 s390x; do
+        scripts/build "$preset" morvik "${tests[@]}"
+        scripts/run-tests "$preset" -R '^(digest|same_files|selftest|PackedBits\..*|FrameSource\..*)$'
+    done
+}
+
 # Runs everything that is rarely run in its shortest form, so that it keeps working.
 stage_starts() {
     tidy tests/builds/digest.cpp bench/Limits.cpp
@@ -257,7 +277,7 @@ stage_starts() {
     scripts/packages x86_64
     scripts/validate --tables
     scripts/renew-results
-    git diff --exit-code docs/validation.md docs/scale.md tests/data/ber
+    git diff --exit-code docs/validation.md docs/scale.md tests/data/ber tests/data/same_files.txt
 }
 
 stage_tests() {

@@ -6,7 +6,6 @@
 #include <cmath>
 #include <numeric>
 
-
 namespace {
 
 using namespace morvik::link;
