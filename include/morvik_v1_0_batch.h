@@ -165,7 +165,8 @@ MORVIK_API int32_t veltra_ip_morvik_v1_0_batch_count_errors_i8(veltra_ip_morvik_
 
 /** Chooses how a state computes. A new state takes the best way that the machine has; all give the same bits.
  *
- *     avx512, avx2, ssse3    one lane for each segment of a block, on vectors of that instruction set
+ *     avx512, avx2, ssse3    one lane for each segment of a block, on vectors of that instruction set of x86
+ *     neon                   the same on those of 64-bit ARM
  *     generic                the same on what every machine has
  *     component              the components of the model one by one
  *

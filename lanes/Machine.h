@@ -1,6 +1,6 @@
 // Machine: everything that differs between instruction sets, one section for each.
 //
-// A section inherits what it does not redefine from the one before. It offers:
+// A section inherits what it does not redefine from one before. It offers:
 //
 //   VectorLanes             the widths of its vectors
 //   Kernels                 the shapes of its kernels, ascending in lanes
@@ -26,6 +26,8 @@
 
 #if defined(__SSE2__)
 #include <immintrin.h>
+#elif defined(MORVIK_NEON)
+#include <arm_neon.h>
 #endif
 
 namespace morvik::lanes::MORVIK_LANES {
@@ -39,6 +41,9 @@ struct Shape {
 template <class... ofKernels>
 struct Shapes {
 };
+
+/// Half of the scale of extrinsic values, times 2^16.
+constexpr std::int16_t halfOfScale = rules::scaleNumerator << (15 - rules::scaleBits);
 
 // ---- Any machine
 
@@ -119,42 +124,11 @@ struct Portable {
     }
 };
 
-// ---- SSE2, which `generic` has on x86-64
+// ---- Byte shuffles, for machines that have `shuffleBytes` and `clippedFrom`: SSSE3 and NEON
 
-#if defined(__SSE2__)
-/// Half of the scale of extrinsic values, times 2^16.
-constexpr std::int16_t halfOfScale = rules::scaleNumerator << (15 - rules::scaleBits);
-
-struct Sse2 : Portable {
-    static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)
-    {
-        return {(Raw<8>::Signed)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(halfOfScale))};
-    }
-
-    static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
-    {
-        const auto* const quads = reinterpret_cast<const __m128i*>(values);
-        return (Raw<8>::Signed)_mm_packs_epi32(_mm_loadu_si128(quads), _mm_loadu_si128(quads + 1));
-    }
-};
-#endif
-
-// ---- SSSE3: byte shuffles
-
-#if defined(__SSSE3__)
-MORVIK_INLINE Eighths<8> shuffleBytes(Eighths<8> a, Eighths<8> control)
-{
-    return {(Raw<8>::Signed)_mm_shuffle_epi8((__m128i)a.v, (__m128i)control.v)};
-}
-
-/// Returns clip(a, lo, hi) - lo. Saturating operations clip; requires a >= hi - 32767.
-MORVIK_INLINE Eighths<8> clippedFrom(int lo, int hi, Eighths<8> a)
-{
-    const __m128i raised = _mm_adds_epi16((__m128i)a.v, (__m128i)Eighths<8>::of(32767 - hi).v);
-    return {(Raw<8>::Signed)_mm_subs_epu16(raised, (__m128i)Eighths<8>::of(32767 - hi + lo).v)};
-}
-
-struct Ssse3 : Sse2 {
+/// Adds what byte shuffles do better to a section.
+template <class Section>
+struct ByteShuffles : Section {
     /// A byte shuffle within each sixteen bytes.
     template <unsigned count>
     struct Permutation {
@@ -211,6 +185,40 @@ struct Ssse3 : Sse2 {
         Eighths<count> itsEntries;
     };
 };
+
+// ---- SSE2, which `generic` has on x86-64
+
+#if defined(__SSE2__)
+struct Sse2 : Portable {
+    static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)
+    {
+        return {(Raw<8>::Signed)_mm_mulhi_epi16((__m128i)a.v, _mm_set1_epi16(halfOfScale))};
+    }
+
+    static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
+    {
+        const auto* const quads = reinterpret_cast<const __m128i*>(values);
+        return (Raw<8>::Signed)_mm_packs_epi32(_mm_loadu_si128(quads), _mm_loadu_si128(quads + 1));
+    }
+};
+#endif
+
+// ---- SSSE3
+
+#if defined(__SSSE3__)
+MORVIK_INLINE Eighths<8> shuffleBytes(Eighths<8> a, Eighths<8> control)
+{
+    return {(Raw<8>::Signed)_mm_shuffle_epi8((__m128i)a.v, (__m128i)control.v)};
+}
+
+/// Returns clip(a, lo, hi) - lo. Saturating operations clip; requires a >= hi - 32767.
+MORVIK_INLINE Eighths<8> clippedFrom(int lo, int hi, Eighths<8> a)
+{
+    const __m128i raised = _mm_adds_epi16((__m128i)a.v, (__m128i)Eighths<8>::of(32767 - hi).v);
+    return {(Raw<8>::Signed)_mm_subs_epu16(raised, (__m128i)Eighths<8>::of(32767 - hi + lo).v)};
+}
+
+struct Ssse3 : ByteShuffles<Sse2> {};
 #endif
 
 // ---- AVX2: vectors of sixteen lanes
@@ -332,6 +340,38 @@ struct Avx512 : Avx2 {
 };
 #endif
 
+// ---- NEON of 64-bit ARM, in little-endian order: 32 registers
+
+#if defined(MORVIK_NEON)
+MORVIK_INLINE Eighths<8> shuffleBytes(Eighths<8> a, Eighths<8> control)
+{
+    return {(Raw<8>::Signed)vqtbl1q_u8((uint8x16_t)a.v, (uint8x16_t)control.v)};
+}
+
+MORVIK_INLINE Eighths<8> clippedFrom(int lo, int hi, Eighths<8> a)
+{
+    const int16x8_t raised = vqaddq_s16((int16x8_t)a.v, (int16x8_t)Eighths<8>::of(32767 - hi).v);
+    return {(Raw<8>::Signed)vqsubq_u16((uint16x8_t)raised, (uint16x8_t)Eighths<8>::of(32767 - hi + lo).v)};
+}
+
+struct Neon : ByteShuffles<Portable> {
+    static constexpr bool holdsTwoRecursions = true;
+
+    /// The high half of the doubled product.
+    static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)
+    {
+        return {(Raw<8>::Signed)vqdmulhq_n_s16((int16x8_t)a.v, halfOfScale / 2)};
+    }
+
+    static MORVIK_INLINE Raw<8>::Signed saturated(const std::int32_t* values)
+    {
+        int32x4_t quads[2];
+        std::memcpy(quads, values, sizeof quads);
+        return (Raw<8>::Signed)vqmovn_high_s32(vqmovn_s32(quads[0]), quads[1]);
+    }
+};
+#endif
+
 // ---- The machine of this compilation
 
 #if defined(__AVX512BW__) && defined(__AVX512VL__)
@@ -342,6 +382,8 @@ using Machine = Avx2;
 using Machine = Ssse3;
 #elif defined(__SSE2__)
 using Machine = Sse2;
+#elif defined(MORVIK_NEON)
+using Machine = Neon;
 #else
 using Machine = Portable;
 #endif

@@ -11,6 +11,7 @@ constexpr const char* byComponents = "component";
 constexpr const char* instructionSetNames[] = {
 #define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) #name,
 #define MORVIK_X86_INSTRUCTION_SET MORVIK_INSTRUCTION_SET
+#define MORVIK_ARM_INSTRUCTION_SET MORVIK_INSTRUCTION_SET
 #include "lanes/InstructionSets.def"
     byComponents};
 
