@@ -2,6 +2,7 @@
 # Makes the packages of a build and looks into them: by lintian, by what they depend on, and by use of what they hold,
 # unpacked in a folder. `scripts/ci.sh packages` installs them in a system of their own.
 #   contents.sh BUILD SOURCE CPACK
+# EMULATOR in the environment starts programs of another machine, CC and CXX compile them.
 set -euo pipefail
 build=$1 source=$2 cpack=$3
 folder=$(mktemp -d)
@@ -14,14 +15,21 @@ fail() {
 "$cpack" --config "$build/CPackConfig.cmake" -B "$folder" >"$folder/log" 2>&1 || { cat "$folder/log"; fail "cpack fails"; }
 cd "$folder"
 
-version=$("$build/bin/morvik" --version | sed 's/^morvik //')-1
+export EMULATOR=${EMULATOR:-}
+version=$($EMULATOR "$build/bin/morvik" --version | sed 's/^morvik //')-1
 library=libmorvik-v1-0-bitacc-cmodel1 link=libmorvik-link1 checker=libmorvik-checker1 development=libmorvik-v1-0-bitacc-cmodel-dev
 case $(file -L "$build/bin/morvik") in
+    *aarch64*)
+        architecture=arm64
+        multiarch=aarch64-linux-gnu
+        expected=("$library" "$link" "$checker" "$development" morvik morvik-simulators) ;;
     *32-bit*)
         architecture=i386
+        multiarch=i386-linux-gnu
         expected=("$library" "$link" "$checker" "$development" morvik morvik-simulators) ;;
     *)
         architecture=amd64
+        multiarch=x86_64-linux-gnu
         expected=("$library" "$link" "$checker" "$development" morvik morvik-mpi morvik-simulators python3-morvik gr-morvik octave-morvik
             morvik-doc) ;;
 esac
@@ -48,8 +56,8 @@ depends "$development" "$link"
 depends "$development" "$checker"
 depends morvik "$library"
 [ "$(field "$library" Multi-Arch)$(field "$link" Multi-Arch)" = samesame ] || fail "The libraries of two architectures exclude each other"
-if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) == *lib*32* ]]; then
-    fail "A package depends on 32-bit libraries in packages for 64-bit machines"
+if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) =~ lib[^ ]*32|-cross ]]; then
+    fail "A package depends on libraries for compilers of another machine"
 fi
 if [[ "$(field morvik Depends)" == *mpi* ]]; then
     fail "The command drags MPI along"
@@ -64,13 +72,12 @@ paths=$(find root/usr/bin root/usr/lib -type f -exec readelf -d {} + 2>/dev/null
 if grep -rlF -e "$build" -e "$source" root; then
     fail "These files know where they were built"
 fi
-multiarch=${architecture/amd64/x86_64}-linux-gnu
 export LD_LIBRARY_PATH=$folder/root/usr/lib/$multiarch
 share=$folder/root/usr/share
 
 echo "The command"
 vectors=$source/tests/data/vectors
-root/usr/bin/morvik decode "$vectors/k40.csv" --num-pu 8 --iterations 6 --reference "$vectors/k40.bits" --output bits
+$EMULATOR root/usr/bin/morvik decode "$vectors/k40.csv" --num-pu 8 --iterations 6 --reference "$vectors/k40.bits" --output bits
 cmp bits "$vectors/k40.bits"
 for file in man/man1/morvik.1.gz man/man1/morvik-ber.1.gz bash-completion/completions/morvik zsh/vendor-completions/_morvik; do
     [ -s "$share/$file" ] || fail "There is no share/$file"
