@@ -109,7 +109,9 @@ void checkChecker()
                  MORVIK_CHECKER_AGREES,
                  "morvik: block 0: compared 1 of 2 half-iterations, 1 of 1862 "
                  "values: all equal to the model");
-    expectAnswer(one.report(), MORVIK_CHECKER_INCOMPLETE, "morvik: ERROR:checker:Values are missing; set partial if that is intended");
+    expectAnswer(one.report(),
+                 MORVIK_CHECKER_INCOMPLETE,
+                 "morvik: ERROR:checker:Values are missing; set partial if that is intended");
     expectAnswer(one.writeSituations("/nowhere/met.csv"),
                  MORVIK_CHECKER_REFUSED,
                  "morvik: ERROR:checker:Situations are counted only if count_situations asks for it");
