@@ -5,7 +5,6 @@
 #include <array>
 #include <cmath>
 #include <numeric>
-#include <optional>
 #include <type_traits>
 #include <utility>
 
@@ -172,26 +171,25 @@ auto rowAt(const std::vector<std::int32_t>& inputs, std::size_t first)
     return row;
 }
 
-/// Counts a decision in its place, among those on which a correction may be pending in another one, if it is one.
-void countDecision(const Decision& met,
-                   unsigned place,
-                   std::optional<unsigned> placeWithPending,
-                   int algorithm,
-                   std::vector<Situation>& all)
+/// Counts a decision in its place. What may be pending is counted next.
+Counter countDecision(const Decision& met, unsigned place, int algorithm, std::vector<Situation>& all)
 {
     Counter counter(all, place);
     counter.next(met.difference > 0).next(met.difference < 0).next(met.difference == 0).next(met.wraps);
-    if (algorithm != tableAlgorithm) {
-        return;
+    if (algorithm == tableAlgorithm) {
+        const int correction = eighthsOf(corrections()[met.difference]);
+        for (const int entry : entries()) {
+            counter.next(entry == correction && met.difference >= 0);
+            counter.next(entry == correction && met.difference < 0);
+        }
     }
-    const int correction = eighthsOf(corrections()[met.difference]);
-    for (const int entry : entries()) {
-        counter.next(entry == correction && met.difference >= 0);
-        counter.next(entry == correction && met.difference < 0);
-    }
-    if (placeWithPending) {
-        counter.at(*placeWithPending).next(met.addsPending).next(met.isTieOfDifferent).next(met.wouldTurn);
-    }
+    return counter;
+}
+
+/// Counts what is pending with the candidates of a decision, in its place among those that may have something pending.
+void countPending(const Decision& met, unsigned place, Counter counter)
+{
+    counter.at(place).next(met.addsPending).next(met.isTieOfDifferent).next(met.wouldTurn);
 }
 
 /// Hands decisions over to what watches them.
@@ -224,7 +222,11 @@ void countStep(bool isForward, int algorithm, const std::vector<std::int32_t>& i
         return column;
     });
     for (unsigned state = 0; state < states; ++state) {
-        countDecision(watched.decisions[state], state, state, algorithm, all);
+        const Decision& met = watched.decisions[state];
+        const Counter counter = countDecision(met, state, algorithm, all);
+        if (algorithm == tableAlgorithm) {
+            countPending(met, state, counter);
+        }
     }
     all.back().counts[0] += watched.sumWraps ? 1U : 0U;
 }
@@ -240,11 +242,12 @@ constexpr unsigned placeOfNode(unsigned node)
 void countPath(const Watched& watched, unsigned bitsBefore, int algorithm, std::vector<Situation>& all)
 {
     for (unsigned node = 1; node < states; node = 2 * node + (watched.decisions[node].difference < 0 ? 1 : 0)) {
+        const Decision& met = watched.decisions[node];
         const unsigned place = placeOfNode(node);
-        const auto withPending = place < pairsOfBit
-                                     ? std::nullopt
-                                     : std::optional(bitsBefore * (decisionsOfBit - pairsOfBit) + place - pairsOfBit);
-        countDecision(watched.decisions[node], bitsBefore * decisionsOfBit + place, withPending, algorithm, all);
+        const Counter counter = countDecision(met, bitsBefore * decisionsOfBit + place, algorithm, all);
+        if (algorithm == tableAlgorithm && place >= pairsOfBit) {
+            countPending(met, bitsBefore * (decisionsOfBit - pairsOfBit) + place - pairsOfBit, counter);
+        }
     }
 }
 
