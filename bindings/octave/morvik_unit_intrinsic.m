@@ -6,8 +6,8 @@
 % systematic        systematic soft values, -128 to 127
 % twice_intrinsic   -192 to 190. The signal `intrinsic` of traces is its half, rounded down.
 %
-% Values are in eighths. A case is a column; an input of one column counts for all cases. Results are int16. docs/units.md
-% explains the units.
+% Values are in eighths. A case is a column; an input of one column counts for all cases. The values of a single case may
+% also be a row. Results are int16, in columns. docs/units.md explains the units.
 %
 % Errors:   morvik:badCall, morvik:badClass, morvik:badSize, morvik:badValue
 %

@@ -41,7 +41,11 @@ end
 function values = words(caller, name, rows, values)
     if ~isnumeric(values) || ~isreal(values) || issparse(values)
         error('morvik:badClass', '%s: %s has to be a full matrix of real numbers', caller, name);
-    elseif ndims(values) > 2 || size(values, 1) ~= rows
+    end
+    if isequal(size(values), [1, rows])
+        values = values(:);  % a single case
+    end
+    if ndims(values) > 2 || size(values, 1) ~= rows
         error('morvik:badSize', '%s: %s has to have %d rows and a column for each case, but it is %s', caller, name, ...
             rows, strjoin(arrayfun(@num2str, size(values), 'UniformOutput', false), 'x'));
     elseif any(values(:) ~= fix(values(:)))

@@ -24,6 +24,7 @@
 %! assert(morvik_unit_intrinsic(-128:127, 5), int16(floor((-128:127) / 2) + 5));
 %! next = morvik_unit_forward(int8([alpha, beta]), g);
 %! assert(next, [morvik_unit_forward(alpha, g), morvik_unit_forward(beta, g)]);
+%! assert(morvik_unit_forward(alpha.', g.'), morvik_unit_forward(alpha, g));
 %! assert(size(morvik_unit_forward(zeros(8, 0), g)), [8, 0]);
 %! assert(size(morvik_unit_branch(zeros(1, 0), zeros(1, 0))), [4, 0]);
 
