@@ -42,9 +42,15 @@ def output_of(*command):
 
 
 def headers_of(build):
-    """The headers of the system that the compilations have read."""
-    noted = re.findall(r"^    (\S+)$", output_of("ninja", "-C", str(build), "-t", "deps"), re.MULTILINE)
-    paths = {os.path.realpath(os.path.join(build, path)) for path in noted}
+    """The headers of the system that the compilations have read, but for those of tests, which are not in an archive."""
+    paths = set()
+    is_shipped = False
+    for line in output_of("ninja", "-C", str(build), "-t", "deps").splitlines():
+        if line.startswith("    "):
+            if is_shipped:
+                paths.add(os.path.realpath(os.path.join(build, line.strip())))
+        elif line:
+            is_shipped = not re.match(r"(tests|bench|validation)/|.*/tests/", line)
     return sorted(path for path in paths if path.startswith("/usr/"))
 
 

@@ -20,6 +20,7 @@ case $archive in
     *-linux-aarch64.*)
         flags='' compilers=(aarch64-linux-gnu-gcc aarch64-linux-gnu-g++)
         emulator=(qemu-aarch64-static -L /usr/aarch64-linux-gnu) ;;
+    *-windows-x86_64.*) exec "$here/use_windows.sh" "$archive" ;;
     *) fail "$archive is for no system that is known here" ;;
 esac
 export CC=${compilers[0]} CXX=${compilers[1]} CFLAGS=$flags CXXFLAGS=$flags
