@@ -31,6 +31,12 @@ async function load({simd = hasVectors(), module} = {}) {
 
 // ---- Arguments
 
+/** With the defaults for what is left out. */
+function completed(options) {
+    const given = Object.entries(options ?? {}).filter(([name, value]) => value !== undefined);
+    return {...DEFAULTS, ...Object.fromEntries(given)};
+}
+
 function refuse(name, value, expected) {
     const shown = typeof value === "string" ? `"${value}"` : String(value);
     throw new RangeError(`${name} is ${shown}: expected ${expected}`);
@@ -182,7 +188,7 @@ class Morvik {
 
     /** A core's configuration, checked. */
     _core(options) {
-        const {units, algorithm, iterations} = {...DEFAULTS, ...options};
+        const {units, algorithm, iterations} = completed(options);
         if (![2, 4, 8].includes(units)) {
             refuse("units", units, "2, 4 or 8");
         }
@@ -191,7 +197,7 @@ class Morvik {
 
     /** A channel, as the module takes it. */
     _point(options) {
-        const {blockSize, algorithm, ebn0, scale, seed} = {...DEFAULTS, ...options};
+        const {blockSize, algorithm, ebn0, scale, seed} = completed(options);
         const K = this._blockSize(blockSize);
         const milliDecibels = thousandths("ebn0", ebn0, -50, 50);
         const milliScale = scale === "auto" ?

@@ -30,7 +30,7 @@ class RatesView {
     _start() {
         const settings = readSettings(this._morvik);
         const asked = withMistakes("sweep-mistake", () => ({
-            places: placesIn(),
+            ...placesIn(),
             rules: {
                 blockErrors: wholeIn("block-errors", "The number of block errors", 1, 1000000000),
                 maxBlocks: wholeIn("max-blocks", "The number of blocks", 1, 1000000000),
@@ -50,11 +50,9 @@ class RatesView {
                 find("sweep-mistake").textContent = mistake ?? "";
                 this._redrawSoon();
             }});
-        const {from, to, step} = {from: find("from").value, to: find("to").value, step: find("step").value};
-        const range = asked.places.length > 1 ? [from, step, to].map(text => text.trim()).join(":") : asked.places[0];
         showCommand(
             "sweep-command",
-            `${commandOf(settings)} --each-iteration --ebn0 ${range} ` +
+            `${commandOf(settings)} --each-iteration --ebn0 ${asked.range} ` +
             `--block-errors ${asked.rules.blockErrors} --max-blocks ${asked.rules.maxBlocks}`);
         this._draw();
     }
@@ -148,7 +146,7 @@ class RatesView {
     }
 }
 
-/** The places of a sweep in dB. Steps are counted in thousandths, as those of the command. */
+/** The places of a sweep in dB, and as the command takes them. Steps are counted in thousandths, as those of the command. */
 function placesIn() {
     const from = decibelsIn("from", "The start");
     const to = decibelsIn("to", "The end");
@@ -164,7 +162,8 @@ function placesIn() {
     if (count > MOST_POINTS) {
         refuseField(find("step"), `These are ${count} points: at most ${MOST_POINTS} are simulated.`);
     }
-    return Array.from({length: count}, (none, i) => (first + i * by) / 1000);
+    const places = Array.from({length: count}, (none, i) => (first + i * by) / 1000);
+    return {places, range: count > 1 ? `${from}:${step}:${to}` : String(from)};
 }
 
 /** Two decimals, three where they are needed. */

@@ -194,5 +194,6 @@ test("what is not allowed is refused by name", () => {
     assert.throws(() => count.take({first: 0, count: 2, counts: new Uint32Array(3)}), /^RangeError: counts/);
     assert.throws(() => count.result(9), /^RangeError: iteration is 9/);
     count.end();
+    assert.deepEqual(vectors.decode(block, {units: undefined}), vectors.decode(block, {units: 2}));
     assert.deepEqual(ALGORITHMS, ["max-log", "scaled", "table"]);
 });

@@ -227,7 +227,7 @@ class PageInBrowser(unittest.TestCase):
     def test_rates_of_other_cores_are_the_commands(self):
         for settings in ((40, 2, "max-log", 2, 0, 7), (2048, 4, "table", 3, 0, 18446744073709551615)):
             self.set(*settings)
-            self.simulate(**{"from": -0.5, "to": 3.5, "step": 2, "block_errors": 30, "max_blocks": 300, "workers": 3})
+            self.simulate(**{"from": "−0.50", "to": 3.5, "step": 2, "block_errors": 30, "max_blocks": 300, "workers": 3})
             self.check_sweep()
 
     def test_a_sweep_is_stopped_and_begun_anew(self):
