@@ -1,6 +1,7 @@
 // CommandTest: fixture and helpers for the tests of the command.
 #include "CommandTest.h"
 
+#include <cstdlib>
 #include <filesystem>
 #include <regex>
 #include <sstream>
@@ -49,7 +50,18 @@ testing::AssertionResult isSummary(const std::string& text, const std::string& b
     return testing::AssertionFailure() << "not the summary \"" << beginning << ", ...\": " << text;
 }
 
-CommandTest::CommandTest() : morvik(std::filesystem::absolute(MORVIK_COMMAND).string()) {}
+namespace {
+
+/// The command of this build, or another in its place.
+std::string command()
+{
+    const char* const other = std::getenv("MORVIK_TEST_COMMAND");
+    return std::filesystem::absolute(other == nullptr ? MORVIK_COMMAND : other).string();
+}
+
+}  // namespace
+
+CommandTest::CommandTest() : morvik(command()) {}
 
 CommandResult CommandTest::decode(const std::string& text, const std::vector<std::string>& options) const
 {

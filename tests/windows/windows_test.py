@@ -116,9 +116,6 @@ class Built(unittest.TestCase):
             self.assertGreater(len(moves), 1000)
             self.assertFalse([move for move in moves if re.match(r"vmov(aps|apd|dqa)", move)])
 
-    def test_a_c_program_decodes(self):
-        self.assertEqual(call("wine", PROGRAMS / "c_program.exe").returncode, 0)
-
     def test_an_installed_copy_is_linked_with(self):
         with tempfile.TemporaryDirectory(dir=BUILD) as holder:
             copy = pathlib.Path(holder) / "a copy"
