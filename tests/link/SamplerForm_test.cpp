@@ -62,7 +62,7 @@ std::vector<AliasTable> tables()
 {
     std::vector<AliasTable> made;
     for (const double scale : {0.3, 8.0, 30.0, 127.0, 1000.0}) {
-        made.emplace_back(roundedDistribution(0.9L, scale).weights);
+        made.emplace_back(roundedDistribution(0.9, scale).weights);
     }
     AliasTable::Weights equal;
     equal.fill(std::uint64_t{1} << 40);
@@ -111,7 +111,7 @@ TEST_P(EverySamplerForm, DrawsWhatTheDefinitionSays)
 TEST_P(EverySamplerForm, DrawsAnyNumberOfGroups)
 {
     const SamplerForm form = GetParam();
-    const AliasTable table(roundedDistribution(0.9L, 8).weights);
+    const AliasTable table(roundedDistribution(0.9, 8).weights);
     const RandomKey key = randomKey(5);
     for (std::size_t count = 0; count < 12; ++count) {
         std::vector<GuardedGroup> drawn;
