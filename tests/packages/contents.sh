@@ -56,7 +56,8 @@ depends "$development" "$link"
 depends "$development" "$checker"
 depends morvik "$library"
 [ "$(field "$library" Multi-Arch)$(field "$link" Multi-Arch)" = samesame ] || fail "The libraries of two architectures exclude each other"
-if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) =~ lib[^ ]*32|-cross ]]; then
+foreign='lib[^ ]*32|-cross'
+if [[ $(for package in *.deb; do dpkg-deb --field "$package" Depends; done) =~ $foreign ]]; then
     fail "A package depends on libraries for compilers of another machine"
 fi
 if [[ "$(field morvik Depends)" == *mpi* ]]; then
