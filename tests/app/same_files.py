@@ -18,10 +18,13 @@ DATA = Path(__file__).resolve().parents[1] / "data"
 HASHES = DATA / "same_files.txt"
 BLOCKS = DATA / "vectors"
 SETS = {
-    "blocks": "--num-pu 8 --block-size 40,104 --blocks 2 --no-directed --format memh,csv,npy,c --soft --internal",
-    "directed": "--algorithm table --num-pu 4 --block-size 512 --blocks 4 --ebn0 0 --width 16 --streams separate",
+    "blocks": "--num-pu 8 --block-size 40,104 --blocks 2 --no-directed --format memh,csv,npy,c --soft --internal "
+              "--no-situations",
+    "directed": "--algorithm table --num-pu 4 --block-size 512 --blocks 4 --ebn0 0 --width 16 --streams separate "
+                "--no-situations",
     "transport": "--algorithm max-log --transport-block-size 2000 --code-rate 0.7 --modulation 64qam --channel rayleigh "
-                 "--redundancy-versions 0,2 --soft-buffer-bits 6 --demapper exact --esn0 12 --blocks 2 --no-directed --soft",
+                 "--redundancy-versions 0,2 --soft-buffer-bits 6 --demapper exact --esn0 12 --blocks 2 --no-directed --soft "
+                 "--no-situations",
     "units": "--unit intrinsic,branch,forward,backward,ratio,extrinsic,address,tail,border --cases 100 --format memh,csv,npy,c",
 }
 PRINTED = {
