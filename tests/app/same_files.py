@@ -1,7 +1,7 @@
 """Checks that the command writes the same files on every machine, to the byte: results of simulations as tests/data/ber
 keeps them; vectors, traces, code words and what commands print as tests/data/same_files.txt has their SHA-256.
 
-same_files.py MORVIK [--renew]
+same_files.py MORVIK [--renew | SameFiles.test_same_vectors | SameFiles.test_same_results]
 """
 
 import hashlib
@@ -72,13 +72,13 @@ class SameFiles(unittest.TestCase):
         self.addCleanup(scratch.cleanup)
         self.folder = Path(scratch.name)
 
-    def test_of_vectors_traces_and_blocks(self):
+    def test_same_vectors(self):
         found = hashes_of(self.folder)
         expected = dict(reversed(line.split()) for line in HASHES.read_text(encoding="ascii").splitlines())
         self.assertEqual({name for name in expected.keys() | found.keys() if expected.get(name) != found.get(name)}, set())
         self.assertGreater(len(found), 60)
 
-    def test_of_simulations(self):
+    def test_same_results(self):
         for line in (DATA / "ber" / "commands.txt").read_text(encoding="ascii").splitlines():
             name, options = line.split(maxsplit=1)
             run(f"ber {options} --quiet --output {name}", self.folder)
