@@ -2,11 +2,13 @@
 
 import re
 
-LARGEST = 8
+LARGEST = 12
 
-# A type, an alias, a constant or a function that begins at the start of a line.
-DEFINITION = re.compile(r"^(?:(?:struct|class|enum class|enum) (\w+)|using (?:\w+::)*(\w+)|const(?:expr)? .*?(\w+)(?: =|\{|\[)"
-                        r"|\w[^;=]*?(?<!::)\b(\w+)\([^;]*$)", re.MULTILINE)
+# A type, an alias, a constant or a function that begins at the start of a line. Names of capital letters are macros.
+DEFINITION = re.compile(r"^(?:(?:struct|class|enum class|enum) (\w+)|using (?!namespace)(?:\w+::)*(\w+)"
+                        r"|const(?:expr)? .*?(\w+)(?: =|[{[(])|\w[^;=]*?(?<!::)\b(?![A-Z_]+\()(\w+)\([^;]*$)", re.MULTILINE)
+
+NAMESPACE = re.compile("^using namespace .*", re.MULTILINE)
 
 
 class Unit:
@@ -26,11 +28,13 @@ class Unit:
 
 
 def units_of(sources, kind_of):
-    """Units of the paths `sources`; those of a unit have one kind in common, which the function `kind_of` tells."""
+    """Units of the paths `sources`; those of a unit have one kind in common, which the function `kind_of` tells,
+    and what they use of namespaces."""
     units = []
     for source in sources:
-        kind = kind_of(source)
-        names = {name for found in DEFINITION.findall(source.read_text()) for name in found if name}
+        text = source.read_text()
+        kind = kind_of(source), sorted(NAMESPACE.findall(text))
+        names = {name for found in DEFINITION.findall(text) for name in found if name}
         unit = next((unit for unit in units if unit.takes(kind, names)), None)
         if not unit:
             unit = Unit(kind)

@@ -78,7 +78,7 @@ std::vector<int> ChainSender::bufferOf(const plain::Bits& block, unsigned filler
 
 plain::Bits ChainSender::codedBits(const plain::Bits& block, unsigned version) const
 {
-    const plain::Segmentation cut = plain::segmentation(format.A);
+    const plain::CodeBlockSizes cut = plain::codeBlockSizes(format.A);
     const std::vector<plain::Bits> codeBlocks = plain::codeBlocks(block);
     std::vector<plain::Bits> parts;
     for (unsigned r = 0; r < cut.C; ++r) {
@@ -191,7 +191,7 @@ std::vector<ChainAccident> accidentsOf(const ChainSender& sender)
                  s.symbol.push_back(i ^ 1U);
              }
          }}};
-    const plain::Segmentation cut = plain::segmentation(sender.format.A);
+    const plain::CodeBlockSizes cut = plain::codeBlockSizes(sender.format.A);
     if (cut.F > 0) {
         all.push_back({"fillers", "filler bits are taken as data", [](ChainSender& s) {
                            s.sendsFillers = true;

@@ -97,7 +97,7 @@ Bits crc24B(const Bits& bits)
     return remainder(bits, {24, 23, 6, 5, 1, 0});
 }
 
-Segmentation segmentation(unsigned A)
+CodeBlockSizes codeBlockSizes(unsigned A)
 {
     const std::vector<unsigned> sizes = blocks::blockSizes();
     const unsigned Z = 6144;
@@ -114,7 +114,7 @@ Segmentation segmentation(unsigned A)
     while (C * sizes[i] < Bprime) {
         ++i;
     }
-    Segmentation s{C, sizes[i], 1, 0, 0, 0};
+    CodeBlockSizes s{C, sizes[i], 1, 0, 0, 0};
     if (C > 1) {
         s.Kminus = sizes[i - 1];
         s.Cminus = (C * s.Kplus - Bprime) / (s.Kplus - s.Kminus);
@@ -126,7 +126,7 @@ Segmentation segmentation(unsigned A)
 
 std::vector<Bits> codeBlocks(const Bits& transportBlock)
 {
-    const Segmentation s = segmentation(static_cast<unsigned>(transportBlock.size()));
+    const CodeBlockSizes s = codeBlockSizes(static_cast<unsigned>(transportBlock.size()));
     Bits b = transportBlock;
     const Bits parity = crc24A(transportBlock);
     b.insert(b.end(), parity.begin(), parity.end());
@@ -148,7 +148,7 @@ std::vector<Bits> codeBlocks(const Bits& transportBlock)
 
 std::vector<Place> codedPlaces(const Format& format, unsigned rv)
 {
-    const Segmentation s = segmentation(format.A);
+    const CodeBlockSizes s = codeBlockSizes(format.A);
     const unsigned perSymbol = format.NL * format.Qm;
     const unsigned Gprime = format.G / perSymbol;
     const unsigned gamma = Gprime % s.C;

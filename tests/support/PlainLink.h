@@ -14,7 +14,7 @@ Bits crc24A(const Bits& bits);
 Bits crc24B(const Bits& bits);
 
 /// Clause 5.1.2, with its names.
-struct Segmentation {
+struct CodeBlockSizes {
     unsigned C;
     unsigned Kplus;
     unsigned Cplus;
@@ -28,7 +28,7 @@ struct Segmentation {
     }
 };
 
-Segmentation segmentation(unsigned A);
+CodeBlockSizes codeBlockSizes(unsigned A);
 
 /// The input of the turbo encoder for each code block, filler bits as zeros.
 std::vector<Bits> codeBlocks(const Bits& transportBlock);

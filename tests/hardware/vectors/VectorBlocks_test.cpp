@@ -72,7 +72,7 @@ TEST(VectorBlocks, BeginWithTheFramesOfASimulation)
 /// The transport block whose code blocks these decisions are, by clause 5.1.2.
 morvik::plain::Bits transportBlockOf(unsigned A, const std::vector<std::vector<std::uint8_t>>& codeBlocks)
 {
-    const morvik::plain::Segmentation cut = morvik::plain::segmentation(A);
+    const morvik::plain::CodeBlockSizes cut = morvik::plain::codeBlockSizes(A);
     morvik::plain::Bits bits;
     for (std::size_t r = 0; r < codeBlocks.size(); ++r) {
         const std::ptrdiff_t fillers = r == 0 ? static_cast<std::ptrdiff_t>(cut.F) : 0;
@@ -89,7 +89,7 @@ std::vector<int> saturatedValues(const morvik::plain::Format& format,
                                  const std::vector<unsigned>& versions,
                                  unsigned width)
 {
-    const morvik::plain::Segmentation cut = morvik::plain::segmentation(format.A);
+    const morvik::plain::CodeBlockSizes cut = morvik::plain::codeBlockSizes(format.A);
     std::vector<std::size_t> starts = {0};
     for (unsigned r = 0; r < cut.C; ++r) {
         starts.push_back(starts.back() + std::size_t{3} * (cut.size(r) + 4));
@@ -139,7 +139,7 @@ TEST(VectorBlocks, AreThoseOfTransportBlocksBehindRateRecovery)
         const morvik::plain::Format plain = {each.A, each.G, 2, 1, each.NIR};
         morvik::vectors::Core core(settings);
         const std::vector<Stimulus> stimuli = stimuliOf(settings);
-        const std::size_t C = morvik::plain::segmentation(each.A).C;
+        const std::size_t C = morvik::plain::codeBlockSizes(each.A).C;
         ASSERT_EQ(stimuli.size(), 2 * each.versions.size() * C);
         for (std::size_t first = 0; first < stimuli.size(); first += each.versions.size() * C) {
             // After the last transmission, everything decodes.

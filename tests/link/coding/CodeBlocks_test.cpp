@@ -18,7 +18,7 @@ TEST(CodeBlocksTest, AgreesWithTheClause)
 {
     for (unsigned A = 1; A < 100000; A += A < 13000 ? 1 : 37) {
         const CodeBlocks blocks = codeBlocksOf(A);
-        const morvik::plain::Segmentation plain = morvik::plain::segmentation(A);
+        const morvik::plain::CodeBlockSizes plain = morvik::plain::codeBlockSizes(A);
         ASSERT_EQ(blocks.bits, A);
         ASSERT_EQ(blocks.count, plain.C) << A;
         ASSERT_EQ(blocks.fillers, plain.F) << A;
