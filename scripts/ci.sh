@@ -120,7 +120,8 @@ stage_memory-short() {
     local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance|NamesNoMistakeThat'
     many+='|FindsTheSoftBuffer|FindsScales|FindsMistakesBy'
     local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Faults/FaultyCore|Stages/Mistakes|Coverage\.IsWholeInASet"
-    long+='|Self(Test|Check\.(FindsTheLibraryRight|Notices(TheLast|Another|Other)))|VcdDump\.RefusesTimesWithoutAnEnd'
+    long+='|Self(Test|Check\.(FindsTheLibraryRight|Notices(TheLast|Another|Other)))|VcdDump\.RefusesTimesAndChangesWithoutAnEnd'
+    long+='|Vectors\.(ChecksCasesOfUnits|WritesWhatDecodeReads)'
     long+='|Sizes/ModelValues\.FollowFromEachOther/(2560|6144)$'
     local scripts='example_sweep|core_from_document|default_core|same_results|same_vectors'
     memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"

@@ -34,7 +34,7 @@ const Arguments transportBlocks = words(
 const Arguments longPoint = words("--block-size 512 --ebn0 1.4 --frames 0:400000");
 
 /// A point that takes several.
-const Arguments longerPoint = words("--block-size 512 --ebn0 1.4 --frames 0:2500000");
+const Arguments longerPoint = words("--block-size 512 --ebn0 1.4 --frames 0:1200000");
 
 /// Whether the condition comes true within a minute.
 bool comesTrue(const std::function<bool()>& condition)
