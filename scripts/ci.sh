@@ -111,27 +111,32 @@ write_abi() {
 # on those that decode.
 stage_memory() {
     # Long simulations would take ten minutes here; the other tests of the command run the same code.
-    memory_without '^(BerRuns|MpiRuns|Diagnosis\.(FindsEachMistakeInEachSize|BlamesNoiseAlone))'
+    memory_without BerRuns Diagnosis.FindsEachMistakeInEachSize Diagnosis.BlamesNoiseAlone
 }
 
 # Leaves out other long tests whose code shorter tests run as well: statistics over many blocks, self-tests, a dump for
 # each fault, and scripts that check numbers.
 stage_memory-short() {
-    local many='Finds(EachMistake|PairsOf|NothingIn|TheTails|AMissingOr)|BlamesNoiseAlone|TakesNoChance|NamesNoMistakeThat'
-    many+='|FindsTheSoftBuffer|FindsScales|FindsMistakesBy'
-    local long="BerRuns|MpiRuns|(Chain)?Diagnosis\.($many)|Faults/FaultyCore|Stages/Mistakes|Coverage\.IsWholeInASet"
-    long+='|Self(Test|Check\.(FindsTheLibraryRight|Notices(TheLast|Another|Other)))|VcdDump\.RefusesTimesAndChangesWithoutAnEnd'
-    long+='|Vectors\.(ChecksCasesOfUnits|WritesWhatDecodeReads)'
-    long+='|Sizes/ModelValues\.FollowFromEachOther/(2560|6144)$'
-    local scripts='example_sweep|core_from_document|default_core|same_results|same_vectors'
-    memory_without "^($long|Trace\.NeedsNoMore|DefaultScale\.HalfAnd|($scripts)\$)"
+    local long=(BerRuns Faults/FaultyCore Stages/Mistakes Coverage.IsWholeInASet SelfCheck.FindsTheLibraryRight
+        SelfCheck.Notices{TheLast,Another,Other} VcdDump.RefusesTimesAndChangesWithoutAnEnd
+        Vectors.{ChecksCasesOfUnits,WritesWhatDecodeReads} Sizes/ModelValues.FollowFromEachOther/{2560,6144}
+        Trace.NeedsNoMore DefaultScale.HalfAnd)
+    long+=(Diagnosis.{BlamesNoiseAlone,TakesNoChance,Finds{EachMistake,PairsOf,NothingIn,TheTails,AMissingOr}}
+        ChainDiagnosis.{BlamesNoiseAlone,TakesNoChance,NamesNoMistakeThat}
+        ChainDiagnosis.Finds{EachMistake,PairsOf,NothingIn,TheSoftBuffer,MistakesBy,Scales})
+    local scripts=(example_set example_sweep core_from_document default_core regression same_results same_vectors)
+    memory_without "${long[@]}" "${scripts[@]/%/$}"
 }
 
-# memory_without REGEX: a pattern of test names
+# memory_without NAME...: beginnings of names of tests
 memory_without() {
+    local skipped
+    skipped=$(IFS='|'; echo "${*/#/^}")
     scripts/build sanitize
-    scripts/run-tests sanitize -E "$1"
-    scripts/build x86_64 library_test src_test
+    scripts/run-tests sanitize -E "$skipped"
+    scripts/build x86_64 app_test library_test src_test
+    MORVIK_TEST_COMMAND=$PWD/build/sanitize/bin/morvik \
+        scripts/run-tests x86_64 -L '^command$' -R '[.]' -E "$skipped|^BlockLayout|^Programs|^SelfCheck|^SelfTest|^MpiRuns"
     uninitialised library_test 'ExactBlocks.*:*RandomBlocks.*'
     uninitialised src_test 'Generics.*:*State.*:DumpConfig.*:Simulate.*:TDecoder3G.*:*TDecoder3GPU.*'
 }

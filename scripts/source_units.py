@@ -2,13 +2,23 @@
 
 import re
 
-LARGEST = 12
-
 # A type, an alias, a constant or a function that begins at the start of a line. Names of capital letters are macros.
 DEFINITION = re.compile(r"^(?:(?:struct|class|enum class|enum) (\w+)|using (?!namespace)(?:\w+::)*(\w+)"
-                        r"|const(?:expr)? .*?(\w+)(?: =|[{[(])|\w[^;=]*?(?<!::)\b(?![A-Z_]+\()(\w+)\([^;]*$)", re.MULTILINE)
+                        r"|const(?:expr)? .*?(\w+)(?: =|[{[(])|\w[^;=\n]*?(?<!::)\b(?![A-Z_]+\()(\w+)\([^;\n]*$)", re.MULTILINE)
 
 NAMESPACE = re.compile("^using namespace .*", re.MULTILINE)
+
+# What only one source sees. There it hides what headers declare in the namespace around it. (Comments are left out already.)
+OWN = re.compile(r"^namespace \{$(.*?)^\}  $", re.MULTILINE | re.DOTALL)
+
+COMMENT_OR_TEXT = re.compile(r'//.*|"(?:[^"\\\n]|\\.)*"')
+
+# A call, or a type.
+USE = re.compile(r"(?<![.>:\w])(?:(\w+)\(|([A-Z]\w*))")
+
+
+def names_of(pattern, text):
+    return {name for found in pattern.findall(text) for name in found if name}
 
 
 class Unit:
@@ -18,26 +28,27 @@ class Unit:
         self.kind = kind
         self.sources = []
         self.names = set()
+        self.own_names = set()
 
-    def takes(self, kind, names):
-        return self.kind == kind and len(self.sources) < LARGEST and not self.names & names
+    def takes(self, kind, text):
+        return self.kind == kind and not self.names & names_of(DEFINITION, text) and not self.own_names & names_of(USE, text)
 
-    def add(self, source, names):
+    def add(self, source, text):
         self.sources.append(source)
-        self.names |= names
+        self.names |= names_of(DEFINITION, text)
+        self.own_names |= names_of(DEFINITION, "".join(OWN.findall(text)))
 
 
-def units_of(sources, kind_of):
-    """Units of the paths `sources`; those of a unit have one kind in common, which the function `kind_of` tells,
-    and what they use of namespaces."""
+def units_of(sources, kind_of, largest):
+    """Units of up to `largest` of the paths `sources`; those of a unit have one kind in common, which the function `kind_of`
+    tells, and what they use of namespaces."""
     units = []
     for source in sources:
-        text = source.read_text()
+        text = COMMENT_OR_TEXT.sub("", source.read_text())
         kind = kind_of(source), sorted(NAMESPACE.findall(text))
-        names = {name for found in DEFINITION.findall(text) for name in found if name}
-        unit = next((unit for unit in units if unit.takes(kind, names)), None)
+        unit = next((unit for unit in units if len(unit.sources) < largest and unit.takes(kind, text)), None)
         if not unit:
             unit = Unit(kind)
             units.append(unit)
-        unit.add(source, names)
+        unit.add(source, text)
     return units
