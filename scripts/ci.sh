@@ -148,9 +148,9 @@ uninitialised() {
 }
 
 stage_threads() {
-    scripts/build threads threads_test simulation_test
+    scripts/build threads threads_test frame_simulator_test
     build/threads/tests/threads_test --gtest_brief=1
-    build/threads/tests/simulation_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
+    build/threads/tests/frame_simulator_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
 }
 
 # Every fuzzer on its corpus and a few thousand inputs derived from it, always the same ones. With HOSTILE_SECONDS each
