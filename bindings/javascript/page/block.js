@@ -1,5 +1,5 @@
 // One block: wrong bits after each iteration, and its soft values where the core's segments and windows have them.
-import {chosen, commandOf, element, find, readSettings, showCommand, wholeIn, withMistakes} from "./form.js";
+import {chosen, commandOf, decibelsIn, element, find, readSettings, showCommand, wholeIn, withMistakes} from "./form.js";
 
 const MOST_BLOCK = 2 ** 53 - 1;
 const SEARCHED = 6000000;     // bits, which take two seconds
@@ -12,6 +12,7 @@ class BlockView {
         this._morvik = morvik;
         this._iteration = null;  // that is looked at; null: the last one
         this._place = null;      // the step that is looked at
+        find("ebn0").addEventListener("input", () => this.show());
         find("block-number").addEventListener("input", () => this.show());
         find("block-before").addEventListener("click", () => this._go(-1));
         find("block-next").addEventListener("click", () => this._go(1));
@@ -30,6 +31,13 @@ class BlockView {
         return wholeIn("block-number", "The block", 0, MOST_BLOCK);
     }
 
+    /** The settings with the ratio and the number of this block, or null. */
+    _read() {
+        const settings = readSettings(this._morvik);
+        const own = withMistakes("block-mistake", () => ({ebn0: decibelsIn("ebn0", "The Eb/N0"), number: this._number()}));
+        return settings && own && {...settings, ...own};
+    }
+
     _go(by) {
         const number = withMistakes("block-mistake", () => this._number());
         if (number !== null) {
@@ -40,13 +48,12 @@ class BlockView {
 
     /** Goes to the next block that has wrong bits after the last iteration. */
     _search() {
-        const settings = readSettings(this._morvik);
-        const number = withMistakes("block-mistake", () => this._number());
-        if (settings === null || number === null) {
+        const settings = this._read();
+        if (settings === null) {
             return;
         }
         const atOnce = 64;
-        const {iterations, blockSize} = settings;
+        const {iterations, blockSize, number} = settings;
         const end = number + 1 + atOnce * Math.ceil(SEARCHED / blockSize / atOnce);
         for (let first = number + 1; first < end; first += atOnce) {
             const {counts} = this._morvik.simulate(settings, first, atOnce);
@@ -66,21 +73,20 @@ class BlockView {
     // ---- Decoding
 
     show() {
-        const settings = readSettings(this._morvik);
-        const number = withMistakes("block-mistake", () => this._number());
-        find("block-content").hidden = settings === null || number === null;
-        if (find("block-content").hidden) {
+        const settings = this._read();
+        find("block-content").hidden = settings === null;
+        if (settings === null) {
             return;
         }
-        this._decode(settings, number);
+        this._decode(settings);
         this._tellOutcome();
         this._listErrors();
         this._draw();
-        showCommand("block-command", `${commandOf(settings)} --ebn0 ${settings.ebn0} --replay 0:${number}`);
+        showCommand("block-command", `${commandOf(settings)} --ebn0 ${settings.ebn0} --replay 0:${settings.number}`);
     }
 
-    _decode(settings, number) {
-        const block = this._morvik.block({...settings, block: number});
+    _decode(settings) {
+        const block = this._morvik.block({...settings, block: settings.number});
         const coded = this._morvik.encode(block.sent);
         this._settings = settings;
         this._cut = this._morvik.cut(settings.blockSize, settings.units);

@@ -31,7 +31,7 @@ function wholeIn(id, what, least, most) {
     const text = textOf(id, what);
     const value = Number(text);
     if (!/^\d+$/.test(text) || value < least || value > most) {
-        refuseField(find(id), `${what} “${text}” is not possible: a whole number from ${least} to ${most} is.`);
+        refuseField(find(id), `${what} “${text}” is not possible. Choose a whole number from ${least} to ${most}.`);
     }
     return value;
 }
@@ -40,7 +40,7 @@ function wholeIn(id, what, least, most) {
 function wideIn(id, what) {
     const text = textOf(id, what);
     if (!/^\d{1,20}$/.test(text) || BigInt(text) >= 1n << 64n) {
-        refuseField(find(id), `${what} “${text}” is not possible: a whole number from 0 to 18446744073709551615 is.`);
+        refuseField(find(id), `${what} “${text}” is not possible. Choose a whole number from 0 to 18446744073709551615.`);
     }
     return BigInt(text);
 }
@@ -49,7 +49,7 @@ function decibelsIn(id, what, least = -50, most = 50) {
     const text = textOf(id, what);
     const value = Number(text);
     if (!/^-?\d+(\.\d{1,3})?$/.test(text) || value < least || value > most) {
-        refuseField(find(id), `${what} “${text}” is not possible: ${least} to ${most} dB with at most three decimals are.`);
+        refuseField(find(id), `${what} “${text}” is not possible. Choose ${least} to ${most} dB, with at most three decimals.`);
     }
     return value;
 }
@@ -92,7 +92,6 @@ function readSettings(morvik) {
         units: Number(chosen("units")),
         algorithm: chosen("algorithm"),
         iterations: wholeIn("iterations", "The number of iterations", 1, 15),
-        ebn0: decibelsIn("ebn0", "The Eb/N0"),
         seed: wideIn("seed", "The seed"),
     }));
 }

@@ -38,6 +38,7 @@ class RatesView {
             workers: wholeIn("workers", "The number of workers", 1, 64),
         }));
         if (settings === null || asked === null) {
+            document.querySelector("#settings [aria-invalid], #sweep [aria-invalid]").focus();
             return;
         }
         find("start").textContent = "Stop";

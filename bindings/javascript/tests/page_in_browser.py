@@ -29,8 +29,8 @@ REFUSED = [
     ("block-size", "5.12e2", "settings-mistake", "does not exist"),
     ("iterations", "16", "settings-mistake", "from 1 to 15"),
     ("iterations", "-1", "settings-mistake", "from 1 to 15"),
-    ("ebn0", "much", "settings-mistake", "The Eb/N0 “much” is not possible"),
-    ("ebn0", "0.0001", "settings-mistake", "three decimals"),
+    ("ebn0", "much", "block-mistake", "The Eb/N0 “much” is not possible"),
+    ("ebn0", "0.0001", "block-mistake", "three decimals"),
     ("seed", "18446744073709551616", "settings-mistake", "from 0 to 18446744073709551615"),
     ("block-number", "x", "block-mistake", "The block “x” is not possible"),
     ("block-number", "99999999999999999999", "block-mistake", "is not possible"),
@@ -235,6 +235,7 @@ class PageInBrowser(unittest.TestCase):
         self.check_sweep()
         self.type("max-blocks", "1000000000")
         self.evaluate("document.getElementById('start').click()")
+        self.type("ebn0", "1")  # of the one block
         self.assertEqual(self.text("#start"), "Stop")
         self.wait("document.querySelectorAll('#rows tr.waiting').length === 0")
         self.evaluate("document.getElementById('start').click()")
@@ -267,7 +268,16 @@ class PageInBrowser(unittest.TestCase):
             self.evaluate("document.getElementById('start').click()")
             self.assertIn(words, self.text("#sweep-mistake"), (field, value))
             self.assertEqual(self.text("#start"), "Simulate")
+            self.assertEqual(self.evaluate("document.activeElement.getAttribute('aria-invalid')"), "true", (field, value))
             self.type(field, before)
+
+    def test_leads_to_the_setting_that_keeps_it_from_simulating(self):
+        self.type("ebn0", "much")
+        self.type("iterations", "16")
+        self.evaluate("document.getElementById('start').click()")
+        self.assertEqual(self.evaluate("document.activeElement.id"), "iterations")
+        self.type("iterations", "8")
+        self.simulate(**{"from": 0, "to": 0, "step": 1, "block_errors": 5, "max_blocks": 10})
 
     # ---- Everywhere
 
