@@ -25,7 +25,7 @@ case $archive in
 esac
 export CC=${compilers[0]} CXX=${compilers[1]} CFLAGS=$flags CXXFLAGS=$flags
 
-tar --extract --file="$archive"
+gzip --decompress --stdout "$archive" | tar --extract  # a bare Debian has no xz
 prefix="$folder/moved here"
 mv morvik-*-linux-* "$prefix"
 cd "$prefix"
@@ -41,8 +41,14 @@ python3 -B "$here/symbols.py" "${libraries[@]}"
 if grep -rlF -e "$(realpath "$here/../..")" -e "$folder" .; then
     fail "These files know where they were built"
 fi
+empty=$(find . -type d -empty)
+[ -z "$empty" ] || fail "These folders are empty: $empty"
+named=$(grep -ohE 'tests/data/vectors/k[0-9]+\.(csv|bits)' share/doc/morvik/docs/*.md | sort -u)
+for file in $named; do
+    [ -s "share/morvik/${file#tests/data/}" ] || fail "The pages need $file"
+done
 for file in man/man1/morvik-decode.1 bash-completion/completions/morvik zsh/site-functions/_morvik doc/morvik/LICENSE \
-    doc/morvik/docs/tools.md; do
+    doc/morvik/docs/tools.md morvik/systemverilog/decoder_env_pkg.sv; do
     [ -s "share/$file" ] || fail "There is no share/$file"
 done
 
