@@ -58,7 +58,7 @@ foreach(command IN LISTS commands)
     install(DIRECTORY ${MORVIK_REFERENCE_DIR}/${command}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} COMPONENT command)
 endforeach()
 install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT documents
-    FILES_MATCHING PATTERN *.md PATTERN *.svg PATTERN *.png PATTERN site EXCLUDE)
+    FILES_MATCHING PATTERN *.md PATTERN *.svg PATTERN *.png PATTERN trace.gtkw PATTERN site EXCLUDE)
 
 set_target_properties(morvik_link_c PROPERTIES EXPORT_NAME morvik_link)
 install(TARGETS morvik_link_c EXPORT morvik_link

@@ -48,7 +48,7 @@ for file in $named; do
     [ -s "share/morvik/${file#tests/data/}" ] || fail "The pages need $file"
 done
 for file in man/man1/morvik-decode.1 bash-completion/completions/morvik zsh/site-functions/_morvik doc/morvik/LICENSE \
-    doc/morvik/docs/tools.md morvik/systemverilog/decoder_env_pkg.sv; do
+    doc/morvik/docs/tools.md doc/morvik/docs/trace.gtkw morvik/systemverilog/decoder_env_pkg.sv; do
     [ -s "share/$file" ] || fail "There is no share/$file"
 done
 
