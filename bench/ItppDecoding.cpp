@@ -91,7 +91,7 @@ private:
     /// Without this check, a wrong input order would only look like a bad decoder.
     void checkWithoutNoise()
     {
-        const NoisyBlocks clean = cleanBlocks(itsWork.blockSize, 1);
+        const NoisyBlocks clean = cleanBlocks({itsWork.blockSize});
         std::vector<std::uint8_t> bits(clean.sent.size());
         decode(received(clean, 0, itsWork.blockSize), bits.begin());
         if (bits != clean.sent) {

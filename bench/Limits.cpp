@@ -79,7 +79,7 @@ Limits::Limits()
 double Limits::cyclesPerStep(const Work& work) const
 {
     const lanes::InstructionSet* const set = instructionSet(work.instructionSet);
-    if (set == nullptr) {
+    if (set == nullptr || work.sizes != Work::Sizes::equal) {
         return 0;
     }
     for (const Limit& limit : itsLimits) {

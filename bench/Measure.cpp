@@ -2,6 +2,7 @@
 #include "Measure.h"
 
 #include <algorithm>
+#include <numeric>
 
 namespace morvik::bench {
 
@@ -17,7 +18,8 @@ Figures figures(const Work& work, const Decoding& decoding, const Sample& sample
     // An iteration takes two steps per bit, one in each pass; a probe step is for 16 lanes.
     constexpr double passes = 2;
     constexpr double lanes = 16;
-    const double bits = 1.0 * work.blocks * work.blockSize;
+    const std::vector<unsigned> sizes = work.blockSizes();
+    const double bits = std::accumulate(sizes.begin(), sizes.end(), 0.0);
     const double cycles = sample.cycles / bits / iterations;
     return {bits / sample.seconds * 1e-6,
             cycles,

@@ -13,11 +13,11 @@ namespace {
 /// A noiseless soft value, in eighths, for a received amplitude of 1.25.
 constexpr int amplitude = 10;
 
-NoisyBlocks makeBlocks(unsigned K, unsigned count, double deviation)
+NoisyBlocks makeBlocks(const std::vector<unsigned>& sizes, double deviation)
 {
     NoisyBlocks made;
-    blocks::Random random(K);
-    for (unsigned i = 0; i < count; ++i) {
+    blocks::Random random(sizes.front());
+    for (const unsigned K : sizes) {
         const std::vector<int> bits = blocks::randomBits(random, K);
         blocks::Block block = blocks::encode(bits, amplitude);
         blocks::addNoise(random, deviation, block);
@@ -35,16 +35,16 @@ NoisyBlocks makeBlocks(unsigned K, unsigned count, double deviation)
 
 }  // namespace
 
-NoisyBlocks noisyBlocks(unsigned K, unsigned count)
+NoisyBlocks noisyBlocks(const std::vector<unsigned>& sizes)
 {
     // sigma^2 = 1 / (2 R Eb/N0) for the rate R = 1/3 and antipodal signals.
     constexpr double decibels = 1.0;
-    return makeBlocks(K, count, amplitude * std::sqrt(3.0 / 2.0 * std::pow(10.0, -decibels / 10.0)));
+    return makeBlocks(sizes, amplitude * std::sqrt(3.0 / 2.0 * std::pow(10.0, -decibels / 10.0)));
 }
 
-NoisyBlocks cleanBlocks(unsigned K, unsigned count)
+NoisyBlocks cleanBlocks(const std::vector<unsigned>& sizes)
 {
-    return makeBlocks(K, count, 0.0);
+    return makeBlocks(sizes, 0.0);
 }
 
 }  // namespace morvik::bench

@@ -8,18 +8,18 @@
 
 namespace morvik::bench {
 
-/// Codewords of one size, the same in every run, as soft values of the core's input format; the three streams block
-/// after block, K + 4 values each.
+/// Codewords, the same in every run, as soft values of the core's input format; the three streams block after block,
+/// K + 4 values each.
 struct NoisyBlocks {
     std::vector<std::uint8_t> sent;
     std::array<std::vector<std::int32_t>, 3> streams;
 };
 
-/// `count` blocks at an Eb/N0 of 1 dB.
-NoisyBlocks noisyBlocks(unsigned K, unsigned count);
+/// A block of each size, one or more, at an Eb/N0 of 1 dB.
+NoisyBlocks noisyBlocks(const std::vector<unsigned>& sizes);
 
 /// The same without noise.
-NoisyBlocks cleanBlocks(unsigned K, unsigned count);
+NoisyBlocks cleanBlocks(const std::vector<unsigned>& sizes);
 
 }  // namespace morvik::bench
 

@@ -36,7 +36,7 @@ struct Column {
     bool isText;
 };
 
-constexpr Column lineColumns[] = {{"K", 4, false},
+constexpr Column lineColumns[] = {{"K", 6, false},
                                   {"units", 5, false},
                                   {"type", 4, false},
                                   {"call", 12, true},
@@ -107,7 +107,7 @@ void Report::addLine(const Work& work, const Figures& figures)
     }
     printRow(itsStream,
              lineColumns,
-             {std::to_string(work.blockSize),
+             {work.sizeText(),
               std::to_string(work.units),
               std::to_string(work.algorithm),
               callText(work),
@@ -128,7 +128,7 @@ void Report::addCompared(const Work& work, const Figures& figures)
     printRow(itsStream,
              comparedColumns,
              {isItpp ? "IT++ LOGMAX" : "morvik, 4 units, type 0",
-              std::to_string(work.blockSize),
+              work.sizeText(),
               callText(work),
               number(figures.megabitsPerSecond, 2),
               number(figures.cyclesPerBitAndIteration, 2),

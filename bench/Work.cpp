@@ -1,12 +1,15 @@
 // Work: the decoding jobs to measure.
 #include "Work.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <utility>
 
 #include "ItppDecoding.h"
 #include "MorvikDecoding.h"
 #include "lanes/InstructionSets.h"
+#include "rules/BlockSizes.h"
+#include "support/Blocks.h"
 
 namespace morvik::bench {
 
@@ -27,6 +30,9 @@ void addBest(std::vector<Work>& all, const std::string& best)
     all.push_back({512, 4, 1, Call::batch, best, 64});
     all.push_back({40, 4, 1, Call::batch, best, 256});
     all.push_back({40, 4, 1, Call::single, best, 1});
+    for (const Work::Sizes sizes : {Work::Sizes::sorted, Work::Sizes::drawn}) {
+        all.push_back({0, 4, 1, Call::single, best, 512, Work::Decoder::morvik, false, sizes});
+    }
 }
 
 void addComparison(std::vector<Work>& all, const std::string& best)
@@ -42,9 +48,29 @@ void addComparison(std::vector<Work>& all, const std::string& best)
 
 }  // namespace
 
+std::string Work::sizeText() const
+{
+    return sizes == Sizes::equal ? std::to_string(blockSize) : sizes == Sizes::drawn ? "drawn" : "sorted";
+}
+
+std::vector<unsigned> Work::blockSizes() const
+{
+    std::vector<unsigned> each(blocks, blockSize);
+    if (sizes != Sizes::equal) {
+        blocks::Random random;
+        for (unsigned& K : each) {
+            K = rules::blockSizes[blocks::below(random, static_cast<unsigned>(rules::blockSizes.size()))].K;
+        }
+    }
+    if (sizes == Sizes::sorted) {
+        std::sort(each.begin(), each.end());
+    }
+    return each;
+}
+
 std::string Work::name() const
 {
-    const std::string size = "K=" + std::to_string(blockSize);
+    const std::string size = "K=" + sizeText();
     const std::string calls = call == Call::single ? "/single" : "/batch";
     if (decoder == Decoder::itpp) {
         return "compare/" + size + calls + "/itpp";
@@ -72,7 +98,7 @@ std::vector<Work> allWork()
 }
 
 Decoding::Decoding(const Work& work)
-    : itsWork(work), itsBlocks(noisyBlocks(work.blockSize, work.blocks)), itsDecisions(itsBlocks.sent.size())
+    : itsWork(work), itsSizes(work.blockSizes()), itsBlocks(noisyBlocks(itsSizes)), itsDecisions(itsBlocks.sent.size())
 {
 }
 

@@ -19,16 +19,27 @@ struct Work {
     enum class Decoder { morvik, itpp };
     enum class Call { single, batch };
 
-    unsigned blockSize;
-    int units;      ///< of morvik, like the next three
-    int algorithm;  ///< type 0, 1 or 2
+    /// Blocks of one size, or of sizes drawn at random from all of the standard: as drawn, so that nearly each block
+    /// has another size than the one before, or sorted.
+    enum class Sizes { equal, drawn, sorted };
+
+    unsigned blockSize;  ///< 0 for sizes that are drawn
+    int units;           ///< of morvik, like the next three
+    int algorithm;       ///< type 0, 1 or 2
     Call call;
     std::string instructionSet;  ///< a name of the batch header
     unsigned blocks;             ///< decoded at a time
     Decoder decoder = Decoder::morvik;
     bool compared = false;  ///< part of the comparison of decoders
+    Sizes sizes = Sizes::equal;
 
     std::string name() const;
+
+    /// The block size, or how sizes that are drawn follow each other.
+    std::string sizeText() const;
+
+    /// The size of each block.
+    std::vector<unsigned> blockSizes() const;
 
     /// Calls per run.
     unsigned calls() const
@@ -60,6 +71,7 @@ protected:
     explicit Decoding(const Work& work);
 
     const Work itsWork;
+    const std::vector<unsigned> itsSizes;
     const NoisyBlocks itsBlocks;
     std::vector<std::uint8_t> itsDecisions;  ///< block after block
 };

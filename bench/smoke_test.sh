@@ -5,7 +5,7 @@
 set -euo pipefail
 json=$(mktemp)
 trap 'rm -f "$json"' EXIT
-output=$("$1" --filter 'K=40/|compare/K=512/' --repetitions 2 --seconds 0.001 --json "$json")
+output=$("$1" --filter 'K=40/|K=(drawn|sorted)/|compare/K=512/' --repetitions 2 --seconds 0.001 --json "$json")
 fail() {
     echo "smoke_test.sh: $1 in:" >&2
     echo "$output" >&2
@@ -19,6 +19,9 @@ number='[0-9]+(\.[0-9]+)?(e-[0-9]+)?'
 positive=' +[0-9]*[1-9][0-9]*\.[0-9]+| +[0-9]+\.[0-9]*[1-9][0-9]*'
 expect 1 'table of lines' '^\| +K \| units \| type \| call +\| instruction set \| +Mbit/s \|.*\| ratio to probe \|$'
 expect 2 'lines of 40 bits' "^\\| +40 \\| +4 \\| +1 \\| [a-z0-9 ]+ \\| [a-z0-9]+ +(\\|($positive) ){4}\\|\$"
+for order in sorted drawn; do
+    expect 1 "line of sizes, $order" "^\\| +$order \\| +4 \\| +1 \\| single +\\| [a-z0-9]+ +(\\|($positive) ){3}\\| +- \\|\$"
+done
 expect 1 'table of decoders' '^\| decoder +\| +K \|.*\| bit error rate \|$'
 expect 2 'lines of morvik among the decoders' \
     "^\\| morvik, 4 units, type 0 \\| +512 \\| [a-z0-9 ]+ (\\|($positive) ){3}\\| +$number \\|\$"
@@ -33,7 +36,7 @@ fi
 python3 - "$json" <<'PYTHON' || fail 'the JSON is not that'
 import json, sys
 lines = json.load(open(sys.argv[1]))["benchmarks"]
-assert len(lines) >= 8 and all(line["Mbit/s"] > 0 for line in lines), lines
+assert len(lines) >= 12 and all(line["Mbit/s"] > 0 for line in lines), lines
 assert [line["repetition"] for line in lines] == [0, 1] * (len(lines) // 2), lines
 PYTHON
 
