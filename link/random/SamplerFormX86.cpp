@@ -359,6 +359,39 @@ MORVIK_AVX2 MORVIK_INLINE __m256i countersFrom(std::uint64_t first, __m256i orde
     return _mm256_add_epi64(_mm256_set1_epi64x(static_cast<long long>(first)), order);
 }
 
+MORVIK_AVX2 MORVIK_INLINE void drawGroup(const AliasTable& table,
+                                         const Random256& lower,
+                                         const Random256& upper,
+                                         ValueGroup& group)
+{
+    std::int8_t values[64];
+    const Left32 first = drawHalf(table, lower, static_cast<std::uint32_t>(group.bits & 0xFFFFFFFF), values);
+    const Left32 second = drawHalf(table, upper, static_cast<std::uint32_t>(group.bits >> 32), values + 32);
+    if (group.count == sizeof values) {  // nearly always, and then no call
+        std::memcpy(group.values, values, sizeof values);
+    } else {
+        std::memcpy(group.values, values, group.count);
+    }
+    const std::uint64_t used = lowBits(group.count);
+    group.undecided = (first.undecided | second.undecided << 32) & used;
+    group.ends = (first.ends | second.ends << 32) & used;
+}
+
+template <std::size_t count>
+MORVIK_AVX2 MORVIK_INLINE void drawGroups(const RoundKeys& keys, const AliasTable& table, ValueGroup* groups)
+{
+    Random256 random[2 * count];
+    for (std::size_t g = 0; g < count; ++g) {
+        const __m256i high = _mm256_set1_epi64x(static_cast<long long>(groups[g].counterHigh));
+        random[2 * g] = {countersFrom(groups[g].counterLow, _mm256_setr_epi64x(0, 1, 2, 3)), high};
+        random[2 * g + 1] = {countersFrom(groups[g].counterLow, _mm256_setr_epi64x(4, 5, 6, 7)), high};
+    }
+    philox(keys, random);
+    for (std::size_t g = 0; g < count; ++g) {
+        drawGroup(table, random[2 * g], random[2 * g + 1], groups[g]);
+    }
+}
+
 /// Half a group of noise, as above. Returns which values are undecided.
 MORVIK_AVX2 MORVIK_INLINE std::uint64_t noiseHalf(
     const AliasTable& table, const Random256& coarse, const Random256& fine, std::int16_t* numbers, std::int8_t* levels)
@@ -380,19 +413,12 @@ MORVIK_AVX2 MORVIK_INLINE std::uint64_t noiseHalf(
 MORVIK_AVX2 void drawAvx2(const AliasTable& table, const RandomKey& key, ValueGroup* groups, std::size_t count)
 {
     const RoundKeys keys(key);
-    for (ValueGroup* group = groups; group != groups + count; ++group) {
-        const __m256i low = _mm256_set1_epi64x(static_cast<long long>(group->counterLow));
-        const __m256i high = _mm256_set1_epi64x(static_cast<long long>(group->counterHigh));
-        Random256 random[] = {{_mm256_add_epi64(low, _mm256_setr_epi64x(0, 1, 2, 3)), high},
-                              {_mm256_add_epi64(low, _mm256_setr_epi64x(4, 5, 6, 7)), high}};
-        philox(keys, random);
-        std::int8_t values[64];
-        const Left32 first = drawHalf(table, random[0], static_cast<std::uint32_t>(group->bits & 0xFFFFFFFF), values);
-        const Left32 second = drawHalf(table, random[1], static_cast<std::uint32_t>(group->bits >> 32), values + 32);
-        std::memcpy(group->values, values, group->count);
-        const std::uint64_t used = lowBits(group->count);
-        group->undecided = (first.undecided | second.undecided << 32) & used;
-        group->ends = (first.ends | second.ends << 32) & used;
+    std::size_t done = 0;
+    for (; done + 2 <= count; done += 2) {  // four vectors hide each other's latency
+        drawGroups<2>(keys, table, groups + done);
+    }
+    for (; done < count; ++done) {
+        drawGroups<1>(keys, table, groups + done);
     }
 }
 
