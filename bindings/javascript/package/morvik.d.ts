@@ -74,7 +74,7 @@ export interface Cut {
 
 /** What was counted in blocks `first` to `first` + `count` - 1. */
 export interface Piece {
-    first: number;
+    first: number | bigint;
     count: number;
     /** The wrong bits of each block after each iteration, then the clipped soft values of each block. */
     counts: Uint32Array;
@@ -86,7 +86,7 @@ export interface Rules {
     /** End with the block of this number; 1000000 by default. */
     maxBlocks?: number;
     /** The number of the first block; 0 by default. */
-    first?: number;
+    first?: number | bigint;
 }
 
 /** Error rates with bounds of 95 % confidence, as the command's. Without blocks, rates are not numbers. */
@@ -109,11 +109,12 @@ export declare class Count {
     readonly blockSize: number;
     readonly iterations: number;
     readonly isComplete: boolean;
-    /** Takes a piece that `simulate` made of the same options; pieces may come in any order. Returns isComplete. */
+    /** Takes a piece that `simulate` made of the same options; pieces may come in any order, each block once. Returns
+     *  isComplete. */
     take(piece: Piece): boolean;
     /** The counts after an iteration, by default the last one. */
     result(iteration?: number): Result;
-    /** Frees it. */
+    /** Frees it; it can no longer be used. */
     end(): void;
 }
 
@@ -134,7 +135,7 @@ export declare class Morvik {
     /** The soft value for amplitude 1 that `block`, `channel` and `simulate` use. */
     scaleOf(options: PointOptions): number;
 
-    /** Decodes a block; with `blockSize`, all blocks that the streams hold one after the other. */
+    /** Decodes a block; with `blockSize`, all blocks that the streams hold one after the other, at most 2^26 bits. */
     decode(soft: Streams<ArrayLike<number> & Iterable<number>>, options?: CoreOptions & {blockSize?: number}): Decoded;
 
     /** The decisions and ratios after each iteration. */
@@ -142,7 +143,7 @@ export declare class Morvik {
 
     cut(blockSize: number, units?: 2 | 4 | 8): Cut;
 
-    /** Makes and decodes `count` numbered blocks from `first` on. */
+    /** Makes and decodes `count` numbered blocks from `first` on, at most 2^26 bits. */
     simulate(options: PointOptions, first: number | bigint, count: number): Piece;
 
     /** Begins to count a point. */

@@ -1,8 +1,9 @@
 // morvik: the decoder, encoder and channel in JavaScript. morvik.d.ts says what each function takes and returns.
 const ALGORITHMS = ["max-log", "scaled", "table"];
+const STREAM_NAMES = ["systematic", "parity1", "parity2"];
 const TAIL = 4;  // positions of a block behind its K
 const DEFAULTS = {units: 2, algorithm: "scaled", iterations: 8, scale: "auto", seed: 1};
-const POINT_BYTES = 20;
+const MOST_BITS = 1 << 26;  // of a call: with soft values and results, they fit in the memory that a module can have
 
 // A function that puts a vector onto the stack: what has no vectors refuses it.
 const VECTORS = new Uint8Array([
@@ -74,6 +75,37 @@ function algorithmOf(value) {
     return number;
 }
 
+/** As many values as an array has. */
+function lengthOf(name, values) {
+    if (!Number.isSafeInteger(values?.length)) {
+        refuse(name, values, "an array");
+    }
+    return values.length;
+}
+
+/** The lengths of the three streams, the first of them. */
+function positionsOf(streams) {
+    return STREAM_NAMES.map(name => lengthOf(name, streams?.[name]))[0];
+}
+
+/** Block numbers end with 2^64 - 1. */
+function firstOf(value, count) {
+    const [low, high] = words("first", value);
+    if (BigInt(value) + BigInt(count) > 1n << 64n) {
+        refuse("first", value, `at most 2^64 - ${count}, for ${count} blocks`);
+    }
+    return [low, high];
+}
+
+/** How many blocks one call takes. */
+function mostBlocks(K) {
+    return Math.floor(MOST_BITS / K);
+}
+
+function softOf(name, values) {
+    return values instanceof Int8Array ? values : Int8Array.from(values, value => whole(name, value, -128, 127));
+}
+
 function bitsOf(name, bits, count) {
     const copy = Uint8Array.from(bits);
     if (copy.length !== count || !Array.prototype.every.call(bits, bit => bit === 0 || bit === 1)) {
@@ -133,14 +165,14 @@ class Morvik {
 
     /** Calls `use` with the addresses of new memory of these sizes, or of copies of these arrays. */
     _with(parts, use) {
-        const places = parts.map(part => {
-            const place = this._exports.malloc(typeof part === "number" ? part : part.byteLength);
-            if (place === 0) {
-                throw new RangeError("no memory is left");
-            }
-            return place;
-        });
+        const places = [];
         try {
+            for (const part of parts) {
+                places.push(this._exports.malloc(typeof part === "number" ? part : part.byteLength));
+                if (places.at(-1) === 0) {
+                    throw new RangeError("no memory is left");
+                }
+            }
             parts.forEach((part, i) => typeof part === "number" || this._bytes(places[i], part.byteLength).set(
                 new Uint8Array(part.buffer, part.byteOffset, part.byteLength)));
             return use(...places);
@@ -209,7 +241,7 @@ class Morvik {
     // ---- Blocks
 
     encode(bits) {
-        const K = this._blockSize(bits.length);
+        const K = this._blockSize(lengthOf("bits", bits));
         const length = K + TAIL;
         return this._with([bitsOf("bits", bits, K), 3 * length], (from, to) => {
             this._exports.morvikEncode(K, from, to);
@@ -227,10 +259,10 @@ class Morvik {
     }
 
     channel(coded, options) {
-        const point = this._point({blockSize: coded.systematic.length - TAIL, ...options});
+        const point = this._point({blockSize: positionsOf(coded) - TAIL, ...options});
         const length = point[0] + TAIL;
         const bits = new Uint8Array(3 * length);
-        ["systematic", "parity1", "parity2"].forEach((name, i) => bits.set(bitsOf(name, coded[name], length), i * length));
+        STREAM_NAMES.forEach((name, i) => bits.set(bitsOf(name, coded[name], length), i * length));
         return this._with([point, bits, 3 * length], (at, from, to) => {
             const clipped = this._exports.morvikSend(at, from, ...words("block", options.block ?? 0), to);
             return {...this._streams(Int8Array, to, length), clipped};
@@ -248,16 +280,18 @@ class Morvik {
 
     decode(soft, options) {
         const {units, algorithm, iterations} = this._core(options);
-        const positions = soft.systematic.length;
+        const positions = positionsOf(soft);
         const K = this._blockSize(options?.blockSize ?? positions - TAIL);
         const blocks = positions / (K + TAIL);
-        const streams = ["systematic", "parity1", "parity2"].map(name => {
-            if (soft[name].length !== positions || !Number.isInteger(blocks)) {
-                refuse(name, `${soft[name].length} values`, `a multiple of K + 4 = ${K + TAIL}, as many in each stream`);
+        for (const name of STREAM_NAMES) {
+            if (soft[name].length !== positions || !Number.isInteger(blocks) || blocks > mostBlocks(K)) {
+                refuse(name, `${soft[name].length} values`,
+                       `K + 4 = ${K + TAIL} for each of up to ${mostBlocks(K)} blocks, as many in each stream`);
             }
-            return Array.from(soft[name], value => whole(name, value, -128, 127));
-        });
-        return this._with([new Int8Array(streams.flat()), blocks * K, 2 * blocks * K], (from, bits, ratios) => {
+        }
+        const values = new Int8Array(3 * positions);
+        STREAM_NAMES.forEach((name, i) => values.set(softOf(name, soft[name]), i * positions));
+        return this._with([values, blocks * K, 2 * blocks * K], (from, bits, ratios) => {
             this._expectSuccess(
                 this._exports.morvikDecode(units, algorithm, K, iterations, blocks, from, bits, ratios));
             return {bits: this._copy(Uint8Array, bits, blocks * K), ratios: this._copy(Int16Array, ratios, blocks * K)};
@@ -289,10 +323,12 @@ class Morvik {
 
     simulate(options, first, count) {
         const {units, algorithm, iterations} = this._core(options);
-        whole("count", count, 1, 1 << 20);
-        return this._with([this._point(options), 4 * count * (iterations + 1)], (point, counts) => {
+        const at = this._point(options);
+        whole("count", count, 1, mostBlocks(at[0]));
+        const begin = firstOf(first, count);
+        return this._with([at, 4 * count * (iterations + 1)], (point, counts) => {
             this._expectSuccess(this._exports.morvikSimulate(
-                point, units, algorithm, iterations, ...words("first", first), count, counts));
+                point, units, algorithm, iterations, ...begin, count, counts));
             return {first, count, counts: this._copy(Uint32Array, counts, count * (iterations + 1))};
         });
     }
@@ -306,7 +342,7 @@ class Morvik {
     }
 
     rateText(rate, decimals = 2) {
-        return this._text(32, place => this._exports.morvikRateText(rate, decimals, place));
+        return this._text(32, place => this._exports.morvikRateText(rate, whole("decimals", decimals, 0, 20), place));
     }
 
     selfTest() {
@@ -322,21 +358,46 @@ class Count {
 
     constructor(morvik, K, iterations, first, place) {
         Object.assign(this, {_morvik: morvik, blockSize: K, iterations, first, _place: place});
+        this._taken = [[0n, BigInt(first)]];  // ranges of blocks, those before the first as well
     }
 
     take({first, count, counts}) {
-        if (counts.length !== count * (this.iterations + 1)) {
+        whole("count", count, 1, MOST_BITS);
+        if (lengthOf("counts", counts) !== count * (this.iterations + 1)) {
             refuse("counts", `${counts.length} values`, `those of ${this.iterations} iterations and ${count} blocks`);
         }
-        this.isComplete = this._morvik._with([counts], place => this._morvik._exports.morvikCountTake(
-            this._place, ...words("first", first), count, place)) !== 0;
+        const numbers = counts instanceof Uint32Array ?
+            counts : Uint32Array.from(counts, number => whole("counts", number, 0, 2 ** 32 - 1));
+        const [place, begin] = [this._begun(), firstOf(first, count)];
+        this._noteTaken(first, count);
+        this.isComplete = this._morvik._with(
+            [numbers], from => this._morvik._exports.morvikCountTake(place, ...begin, count, from)) !== 0;
         return this.isComplete;
+    }
+
+    /** No block is counted twice. */
+    _noteTaken(first, count) {
+        const [from, to] = [BigInt(first), BigInt(first) + BigInt(count)];
+        if (this._taken.some(([begin, end]) => from < end && begin < to)) {
+            refuse("first", first, `${count} blocks from ${this.first} on that have not been taken`);
+        }
+        const isApart = ([begin, end]) => end !== from && begin !== to;
+        const joined = [[from, to], ...this._taken.filter(range => !isApart(range))].flat().sort((a, b) => (a < b ? -1 : 1));
+        this._taken = [...this._taken.filter(isApart), [joined[0], joined.at(-1)]];
+    }
+
+    /** Where the module keeps it. */
+    _begun() {
+        if (this._place === 0) {
+            throw new Error("the count has been ended");
+        }
+        return this._place;
     }
 
     result(iteration = this.iterations) {
         whole("iteration", iteration, 1, this.iterations);
         return this._morvik._with([80], place => {
-            this._morvik._exports.morvikCountRow(this._place, iteration, place);
+            this._morvik._exports.morvikCountRow(this._begun(), iteration, place);
             const [blocks, bitErrors, blockErrors, clipped, ber, berLow, berHigh, bler, blerLow, blerHigh] =
                 this._morvik._copy(Float64Array, place, 10);
             return {

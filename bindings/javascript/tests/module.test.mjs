@@ -145,6 +145,38 @@ test("the installed package runs the examples of its documents", () => {
     }
 });
 
+test("a count takes each block once, and pieces that were sent as text", () => {
+    const point = {blockSize: 40, ebn0: 0};
+    const piece = (first, count) => {
+        const {counts, ...rest} = vectors.simulate(point, first, count);
+        return {...rest, counts: Array.from(counts)};
+    };
+    const count = vectors.count(point, {maxBlocks: 30, first: 100});
+    for (const [first, blocks] of [[100, 10], [120, 10]]) {
+        count.take(piece(first, blocks));
+    }
+    for (const [first, blocks] of [[100, 10], [105, 1], [109, 2], [115, 10], [95, 3], [90, 50]]) {
+        assert.throws(() => count.take(piece(first, blocks)), new RegExp(`^RangeError: first is ${first}: .*not been taken`));
+    }
+    assert.equal(count.result().blocks, 10);
+    assert.ok(count.take(piece(110, 10)));
+    const whole = vectors.count(point, {maxBlocks: 30, first: 100});
+    whole.take(vectors.simulate(point, 100, 30));
+    assert.deepEqual(count.result(), whole.result());
+    whole.end();
+    for (const use of [() => whole.result(), () => whole.take(piece(130, 1))]) {
+        assert.throws(use, /^Error: the count has been ended/);
+    }
+    whole.end();
+});
+
+test("calls that are as large as they may be find memory", () => {
+    for (const [blockSize, count] of [[40, 1677721], [6144, 10922]]) {
+        const {counts} = vectors.simulate({blockSize, ebn0: 5, iterations: 1}, 0, count);
+        assert.equal(counts.length, 2 * count);
+    }
+});
+
 test("every function is declared, and every declared one is there", () => {
     const text = readFileSync(join(place, "morvik.d.ts"), "utf8");
     const membersOf = name => new RegExp(`^export declare class ${name} \\{\n(.*?)^\\}`, "ms").exec(text)[1];
@@ -189,6 +221,12 @@ test("what is not allowed is refused by name", () => {
     const block = vectors.block(good);
     assert.throws(() => vectors.decode({...block, parity1: [1]}), /^RangeError: parity1/);
     assert.throws(() => vectors.decode({...block, parity2: new Array(44).fill(128)}), /^RangeError: parity2 is 128/);
+    assert.throws(() => vectors.decode({systematic: block.systematic}), /^RangeError: parity1 is undefined: expected an array/);
+    assert.throws(() => vectors.decode(), /^RangeError: systematic is undefined/);
+    assert.throws(() => vectors.encode(), /^RangeError: bits is undefined/);
+    assert.throws(() => vectors.simulate({...good, blockSize: 6144}, 0, 10923), /^RangeError: count is 10923: .* to 10922/);
+    assert.throws(() => vectors.simulate(good, 2n ** 64n - 1n, 2), /^RangeError: first is 18446744073709551615: expected at most 2\^64 - 2/);
+    assert.throws(() => vectors.rateText(0.1, 40), /^RangeError: decimals is 40/);
     const count = vectors.count(good);
     assert.ok(Number.isNaN(count.result().ber));
     assert.throws(() => count.take({first: 0, count: 2, counts: new Uint32Array(3)}), /^RangeError: counts/);
