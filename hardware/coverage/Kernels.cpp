@@ -6,18 +6,13 @@
 #include "PassWalk.h"
 #include "hardware/testbench/Corrections.h"
 #include "hardware/testbench/WatchedDecision.h"
-#include "rules/Correction.h"
 #include "rules/Schedule.h"
 
 namespace morvik::coverage {
 
 namespace {
 
-/// The table of 16 points has an entry for each half of a real unit (rule 9).
-constexpr unsigned log2Points = 4;
-constexpr unsigned entryBits =
-    rules::fractionBits + rules::stateAlignment - rules::resolvedFractionBits(rules::fractionBits, log2Points);
-constexpr int entryCount = 6;  // that are not 0
+constexpr int entryCount = 6;  // of the correction table, that are not 0
 
 /// The members of families that tell kernels apart.
 enum Kernel : unsigned { forwardKernel = 0, backwardKernel = 1, ratioKernel = 2 };
@@ -228,7 +223,7 @@ private:
         if (difference == 0 && c1.pending() != c2.pending()) {
             take(situation(Family::pendingTie, kernel), place);
         }
-        const int entry = (difference < 0 ? ~difference : difference) >> entryBits;
+        const int entry = (difference < 0 ? ~difference : difference) >> correctionEntryBits;
         if (entry >= entryCount) {
             take(situation(Family::noCorrection, kernel), place);
             return;

@@ -1,19 +1,33 @@
 // Corrections: the correction table of algorithm type 2.
 #include "Corrections.h"
 
-#include <memory>
+#include <cstdint>
+#include <limits>
 #include <vector>
-
-#include "src/TCalculationEngineModBase.h"
-#include "src/TNumberFormat.h"
 
 namespace morvik {
 
+namespace {
+
+unsigned char entryOf(std::int32_t difference)
+{
+    const std::int32_t eighths = rules::correction(
+        difference, correctionEntryBits, 1U << log2CorrectionPoints, rules::stateAlignment, 1U << rules::fractionBits);
+    return static_cast<unsigned char>(rules::shiftLeftWrap(eighths, rules::stateAlignment));
+}
+
+}  // namespace
+
 const unsigned char* corrections()
 {
+    using Difference = std::numeric_limits<std::int16_t>;
     static const std::vector<unsigned char> table = [] {
-        const std::unique_ptr<TNumberFormat> format(TNumberFormat::create("Fix_12_3"));
-        return TCalculationEngineModBase::createLUT(16, *format);
+        std::vector<unsigned char> entries;
+        entries.reserve(rules::correctionEntries);
+        for (std::int32_t difference = Difference::min(); difference <= Difference::max(); ++difference) {
+            entries.push_back(entryOf(difference));
+        }
+        return entries;
     }();
     return table.data() + table.size() / 2;
 }

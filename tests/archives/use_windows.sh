@@ -48,20 +48,15 @@ export PKG_CONFIG_PATH="$PWD/lib/pkgconfig"
 eval "$machine-gcc-posix" -std=c99 -static-libgcc share/morvik/examples/decode.c \
     "$(pkg-config --cflags --libs morvik_v1_0_bitacc_cmodel)" -o bin/decode.exe
 wine bin/decode.exe 2>/dev/null | tr -d '\r' | diff - share/morvik/examples/decode.expected
-cat >CMakeLists.txt <<'CMAKE'
-cmake_minimum_required(VERSION 3.16)
-project(user LANGUAGES C)
-find_package(morvik_v1_0_bitacc_cmodel 1.0 REQUIRED)
-add_executable(decode share/morvik/examples/decode.c)
-target_link_libraries(decode morvik::morvik_v1_0_bitacc_cmodel)
-CMAKE
-cmake -S . -B "$folder/cmake" -DCMAKE_SYSTEM_NAME=Windows -DCMAKE_C_COMPILER=$machine-gcc-posix \
-    -DCMAKE_PREFIX_PATH="$PWD" >"$folder/log" || { cat "$folder/log"; fail "cmake fails"; }
+cmake -S share/morvik/examples -B "$folder/cmake" -DCMAKE_SYSTEM_NAME=Windows -DCMAKE_C_COMPILER=$machine-gcc-posix \
+    -DCMAKE_CXX_COMPILER=$machine-g++-posix -DCMAKE_PREFIX_PATH="$PWD" >"$folder/log" || { cat "$folder/log"; fail "cmake fails"; }
 cmake --build "$folder/cmake" >"$folder/log" || { cat "$folder/log"; fail "cmake --build fails"; }
 
 echo "Sources of bindings"
+source=share/morvik/source
 for binding in systemverilog/morvik_dpi vhdl/morvik_vhdl; do
-    $machine-g++-posix -std=c++17 -Wall -Wextra -Werror -Ishare/morvik/source -Iinclude -Iinclude/morvik_v1_0_classes \
-        -c "share/morvik/source/bindings/$binding.cpp" -o "$folder/binding.o"
+    $machine-g++-posix -std=c++17 -Wall -Wextra -Werror -I$source -Iinclude -Iinclude/morvik_v1_0_classes -shared \
+        "$source/bindings/$binding.cpp" $source/bindings/simulator/*.cpp $source/hardware/*/*.cpp \
+        -Llib -lmorvik_checker -lmorvik_v1_0_bitacc_cmodel -o "$folder/${binding#*/}.dll"
 done
 echo "Everything works"
