@@ -271,10 +271,10 @@ bool isSamePlace(const std::string& a, const std::string& b)
         const std::filesystem::path path = std::filesystem::absolute(pathOf(placeOf(name).path));
         std::error_code failed;  // a pipe behind /dev/stdout has no path
         const std::filesystem::path canonical = std::filesystem::weakly_canonical(path, failed);
-        return failed ? path : canonical;
+        return (failed ? path : canonical).u8string();
     };
-    const std::filesystem::path place = whole(a);
-    return place == whole(b) && place != system::nowhere;
+    const std::string place = whole(a);
+    return system::isSameName(place, whole(b)) && !system::isSameName(place, whole(system::nowhere));
 }
 
 void expectDistinct(const std::string& file, const std::string& other)

@@ -37,6 +37,9 @@ struct FileStatus {
     }
 };
 
+/// Whether two names of absolute paths are the same; on Windows, the case of letters makes no difference.
+bool isSameName(const std::string& a, const std::string& b);
+
 /// The status of what a name stands for, links followed.
 std::optional<FileStatus> statusOf(const std::string& name);
 

@@ -146,6 +146,11 @@ void replaceHandler(void (*present)(int), void (*next)(int), int flags)
 
 const char* const nowhere = "/dev/null";
 
+bool isSameName(const std::string& a, const std::string& b)
+{
+    return a == b;
+}
+
 std::optional<FileStatus> statusOf(const std::string& name)
 {
     struct stat found = {};

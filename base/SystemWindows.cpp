@@ -29,6 +29,11 @@ void setErrno()
     case ERROR_LOCK_VIOLATION:
         errno = EACCES;
         break;
+    case ERROR_BROKEN_PIPE:
+    case ERROR_NO_DATA:
+    case ERROR_PIPE_NOT_CONNECTED:
+        errno = EPIPE;
+        break;
     default:
         const std::error_condition known =
             std::error_code(static_cast<int>(error), std::system_category()).default_error_condition();
@@ -201,6 +206,11 @@ std::optional<FileStatus> statusOf(HANDLE file)
 }  // namespace
 
 const char* const nowhere = "NUL";
+
+bool isSameName(const std::string& a, const std::string& b)
+{
+    return CompareStringOrdinal(wide(a).c_str(), -1, wide(b).c_str(), -1, TRUE) == CSTR_EQUAL;
+}
 
 std::optional<FileStatus> statusOf(const std::string& name)
 {

@@ -21,6 +21,7 @@ namespace {
 
 namespace system = morvik::base::system;
 using morvik::base::Descriptor;
+using morvik::base::isSamePlace;
 using morvik::base::OutputFile;
 using morvik::base::OwnFile;
 using morvik::base::pathOf;
@@ -98,6 +99,9 @@ TEST_F(Systems, TellFilesFromOthers)
     EXPECT_FALSE(system::statusOf(path("none")));
     EXPECT_EQ(errno, ENOENT);
     OutputFile(system::nowhere).commit();
+    EXPECT_FALSE(isSamePlace(system::nowhere, system::nowhere)) << "nothing is kept there";
+    EXPECT_TRUE(isSamePlace(name, path("../" + pathOf(folder).filename().u8string() + "/a file")));
+    EXPECT_FALSE(isSamePlace(name, path("another")));
     EXPECT_THROW(OutputFile(path("none/file")), morvik::base::Error);
 }
 

@@ -157,6 +157,24 @@ class Commands(Windows):
             ours, theirs = self.both(*arguments, status=status)
             self.assertEqual(ours.stderr, theirs.stderr)
 
+    def test_takes_names_as_windows_does(self):
+        block = VECTORS / "k40.csv"
+        self.both("trace", block, "--iterations", "1", "--format", "csv", "--output", "dump.csv")
+        compare = ("compare", "--dump", "dump.csv", "--block", block, "--iterations", "1", "--json")
+        folder = self.folder / "windows"
+        result = windows(*compare, "Found.json", "--coverage", "found.JSON", folder=folder)
+        self.assertIn(b"is the same file as found.JSON", result.stderr)
+        self.assertEqual(windows(*compare, "NUL", "--coverage", "nul", folder=folder).returncode, 0)
+
+    def test_tells_that_nobody_reads_on(self):
+        run = subprocess.Popen(["wine", MORVIK, "trace", VECTORS / "k512.csv", "--format", "csv", "--output", "-"],
+                               stdout=subprocess.PIPE, stderr=subprocess.PIPE, env=ENVIRONMENT)
+        run.stdout.close()
+        with run.stderr:
+            message = run.stderr.read()
+        self.assertEqual(run.wait(), 2)
+        self.assertIn(b"<stdout>: cannot be written: Broken pipe", message)
+
     def test_simulates_the_same_error_rates(self):
         for number, arguments in enumerate((
                 ("--block-size", "40,1024", "--num-pu", "2,8", "--algorithm", "scaled,table", "--ebn0", "0:0.5:1.5"),
