@@ -290,9 +290,9 @@ stage_starts() {
         write_abi 64 "$library" build/abi-64.renewed.xml.xz
         compare_abi 64 "$library" build/abi-64.renewed.xml.xz
     done
-    scripts/build coverage rules_test
-    build/coverage/tests/rules_test --gtest_brief=1
-    count_lines 'rules/(Interleaver|Tail)'
+    scripts/build coverage src_test
+    build/coverage/tests/src_test --gtest_brief=1 --gtest_filter='*TNumberFormat.*'
+    count_lines src/TNumberFormat.cpp
     scripts/mutate --only src/TNumberFormat.cpp --every 100 --anew
     scripts/packages x86_64
     scripts/validate --tables
