@@ -21,22 +21,31 @@ def names_of(pattern, text):
     return {name for found in pattern.findall(text) for name in found if name}
 
 
+class Names:
+    """The names that a source defines, those of them that no other source sees, and those that it uses."""
+
+    def __init__(self, text):
+        self.defined = names_of(DEFINITION, text)
+        self.own = names_of(DEFINITION, "".join(OWN.findall(text)))
+        self.used = names_of(USE, text)
+
+
 class Unit:
     """Sources alike in `kind`, such as a folder and flags."""
 
     def __init__(self, kind):
         self.kind = kind
         self.sources = []
-        self.names = set()
-        self.own_names = set()
+        self.defined = set()
+        self.own = set()
 
-    def takes(self, kind, text):
-        return self.kind == kind and not self.names & names_of(DEFINITION, text) and not self.own_names & names_of(USE, text)
+    def takes(self, kind, names):
+        return self.kind == kind and not self.defined & names.defined and not self.own & names.used
 
-    def add(self, source, text):
+    def add(self, source, names):
         self.sources.append(source)
-        self.names |= names_of(DEFINITION, text)
-        self.own_names |= names_of(DEFINITION, "".join(OWN.findall(text)))
+        self.defined |= names.defined
+        self.own |= names.own
 
 
 def units_of(sources, kind_of, largest):
@@ -46,9 +55,10 @@ def units_of(sources, kind_of, largest):
     for source in sources:
         text = COMMENT_OR_TEXT.sub("", source.read_text())
         kind = kind_of(source), sorted(NAMESPACE.findall(text))
-        unit = next((unit for unit in units if len(unit.sources) < largest and unit.takes(kind, text)), None)
+        names = Names(text)
+        unit = next((unit for unit in units if len(unit.sources) < largest and unit.takes(kind, names)), None)
         if not unit:
             unit = Unit(kind)
             units.append(unit)
-        unit.add(source, text)
+        unit.add(source, names)
     return units
