@@ -23,7 +23,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct EncodeOptions {
     std::string input = base::standardStream;
     std::string output = base::standardStream;
     bool transportBlocks = false;
@@ -58,7 +58,7 @@ link::PackedBlocks packed(const std::vector<std::uint8_t>& bits, std::size_t wor
 }
 
 /// Writes the three streams of each block, a row for each position.
-void encodeCodeBlocks(const Options& options, BitLines& lines, base::OutputFile& output)
+void encodeCodeBlocks(const EncodeOptions& options, BitLines& lines, base::OutputFile& output)
 {
     const Symbols symbols(options.amplitude);
     std::map<unsigned, link::TurboEncoder> encoders;
@@ -86,7 +86,7 @@ void encodeCodeBlocks(const Options& options, BitLines& lines, base::OutputFile&
 }
 
 /// A line of coded bits; with an amplitude, a row of soft values.
-std::string codedLine(const Options& options, unsigned block, const std::uint64_t* coded)
+std::string codedLine(const EncodeOptions& options, unsigned block, const std::uint64_t* coded)
 {
     const Symbols symbols(options.amplitude);
     std::string line = options.amplitude == 0 ? "" : std::to_string(block);
@@ -101,7 +101,7 @@ std::string codedLine(const Options& options, unsigned block, const std::uint64_
 
 /// The code of transport blocks of a size, kept in `codes` from the first of them on.
 link::TransportBlockCode& codeFor(unsigned size,
-                                  const Options& options,
+                                  const EncodeOptions& options,
                                   const BitLines& lines,
                                   std::map<unsigned, link::TransportBlockCode>& codes)
 {
@@ -121,7 +121,7 @@ link::TransportBlockCode& codeFor(unsigned size,
 }
 
 /// Writes the coded bits of each transport block, a line for each transmission.
-void encodeTransportBlocks(const Options& options, BitLines& lines, base::OutputFile& output)
+void encodeTransportBlocks(const EncodeOptions& options, BitLines& lines, base::OutputFile& output)
 {
     std::map<unsigned, link::TransportBlockCode> codes;
     link::PackedBlocks buffers;
@@ -141,7 +141,7 @@ void encodeTransportBlocks(const Options& options, BitLines& lines, base::Output
     }
 }
 
-int encode(const Options& options)
+int encode(const EncodeOptions& options)
 {
     base::InputFile input(options.input);
     // Every transport block that can be sent fits into a line.
@@ -163,7 +163,7 @@ int encode(const Options& options)
 }
 
 /// The end of the help text.
-std::string explanation()
+std::string encodeExplanation()
 {
     return std::string("FILE has a line of 0 and 1 for each block. Of code blocks, the output opens with the line\n") +
            softValueHeader + R"(
@@ -180,7 +180,7 @@ Example: 8 kbit in 9600 bits of 64QAM, as soft values that 'morvik decode' reads
 Command addEncode(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("encode", "Encode blocks of bits, or transport blocks");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<EncodeOptions>();
 
     command->add_option("FILE", options->input, "Bits, a line for each block; - for standard input")
         ->type_name("")
@@ -195,7 +195,7 @@ Command addEncode(CLI::App& app)
         ->add_option("--amplitude", options->amplitude, "Write soft values of this amplitude instead of bits, 1 to 127")
         ->transform(integerFrom(1, 127))
         ->type_name("N");
-    command->footer(explanation());
+    command->footer(encodeExplanation());
 
     const auto run = [options] {
         return encode(*options);

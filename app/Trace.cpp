@@ -24,7 +24,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct TraceOptions {
     std::string input = base::standardStream;
     std::string output = base::standardStream;
     std::string format = "text";
@@ -35,7 +35,7 @@ struct Options {
 };
 
 /// Applies --half-iterations, N or A:B; selects all without it.
-void selectPasses(const Options& options, trace::Selection& selection)
+void selectPasses(const TraceOptions& options, trace::Selection& selection)
 {
     const std::uint32_t passes = 2 * options.decoder.iterations;
     selection.last = passes - 1;
@@ -112,7 +112,7 @@ void appendUnit(const std::string& text, std::vector<std::uint32_t>& units)
     units.push_back(*unit);
 }
 
-void checkUnits(const Options& options, const rules::Cut& cut)
+void checkUnits(const TraceOptions& options, const rules::Cut& cut)
 {
     for (const std::uint32_t unit : options.selection.units) {
         if (unit >= cut.unitsAtWork()) {
@@ -125,7 +125,7 @@ void checkUnits(const Options& options, const rules::Cut& cut)
     }
 }
 
-base::OutputFile openOutput(const Options& options)
+base::OutputFile openOutput(const TraceOptions& options)
 {
     base::expectOwnFile(options.output, {options.input}, "traced values");
     base::OutputFile file(options.output);
@@ -135,7 +135,7 @@ base::OutputFile openOutput(const Options& options)
     return file;
 }
 
-std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const rules::Cut& cut)
+std::unique_ptr<trace::TraceWriter> writerOf(const TraceOptions& options, const rules::Cut& cut)
 {
     if (options.format == "vcd" || options.format == "fst") {
         return (options.format == "vcd" ? trace::vcdTrace : trace::fstTrace)(
@@ -147,7 +147,7 @@ std::unique_ptr<trace::TraceWriter> writerOf(const Options& options, const rules
     return trace::tableTrace(std::move(rows), options.block, options.selection);
 }
 
-void write(Options options)
+void writeTrace(TraceOptions options)
 {
     trace::Selection& selection = options.selection;
     selectPasses(options, selection);
@@ -175,14 +175,14 @@ void write(Options options)
     writer->finish();
 }
 
-int run(const Options& options)
+int runTrace(const TraceOptions& options)
 {
-    write(options);
+    writeTrace(options);
     std::cerr << coreLine(options.decoder.generics, options.decoder.iterations);
     return success;
 }
 
-constexpr char explanationBeforeSignals[] =
+constexpr char traceExplanationBeforeSignals[] =
     R"(FILE is read as by 'morvik decode'. Half-iterations count from 0; even ones decode the second,
 interleaved constituent code. 'text' is the library's own trace, which lacks the branch
 metrics. 'vcd' has a scope for each unit and thread, and one unit of time for each trellis step.
@@ -191,14 +191,14 @@ docs/trace.md has the details.
 
 Signals: )";
 
-constexpr char explanationAfterSignals[] =
+constexpr char traceExplanationAfterSignals[] =
     R"(.
 Exit status: 0 written, 2 bad input or usage.
 
 Example: waveforms of the first iteration
   morvik trace k1024.csv --half-iterations 0:1 --format vcd --output k1024.vcd)";
 
-void addSelectionOptions(CLI::App& command, Options& options)
+void addSelectionOptions(CLI::App& command, TraceOptions& options)
 {
     command.add_option("--half-iterations", options.halfIterations, "Passes to write, N or A:B; default: all")
         ->type_name("A:B");
@@ -215,7 +215,7 @@ Command addTrace(CLI::App& app)
 {
     CLI::App* command =
         app.add_subcommand("trace", "Write the internal values of selected passes, as waveforms or tables");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<TraceOptions>();
     command->add_option("FILE", options->input, "Soft values, as CSV; - for standard input")
         ->type_name("")
         ->capture_default_str();
@@ -232,9 +232,9 @@ Command addTrace(CLI::App& app)
         ->capture_default_str();
     addSelectionOptions(*command, *options);
     addDecoderOptions(*command, options->decoder);
-    command->footer(explanationBeforeSignals + knownSignals(",\nand ") + explanationAfterSignals);
+    command->footer(traceExplanationBeforeSignals + knownSignals(",\nand ") + traceExplanationAfterSignals);
     const auto work = [options] {
-        return run(*options);
+        return runTrace(*options);
     };
     return {command, work};
 }

@@ -61,7 +61,7 @@ void expectOptionsOfUnits(const CLI::App& command, const UnitVectors& vectors)
 }
 
 /// The command that makes the files of a unit again, without the folder.
-std::string commandOf(units::Number unit, const UnitVectors& vectors)
+std::string commandOfTable(units::Number unit, const UnitVectors& vectors)
 {
     std::string command = "morvik vectors --unit " + nameOf(unit) + " --algorithm " +
                           simulation::algorithmName(static_cast<unsigned>(vectors.algorithm)) + " --cases " +
@@ -110,7 +110,7 @@ units::Description writeTables(units::Number unit, const UnitVectors& vectors)
         writer->finish();
     }
     return {MORVIK_VERSION,
-            commandOf(unit, vectors),
+            commandOfTable(unit, vectors),
             unit,
             vectors.algorithm,
             extent,
@@ -125,7 +125,7 @@ std::string casesText(const units::Description& made)
            listed(made.formats, [](const units::DescribedFormat& format) { return format.name; });
 }
 
-std::string summaryOf(const units::Description& made)
+std::string unitSummary(const units::Description& made)
 {
     std::string text = casesText(made);
     text += made.extent.isExhaustive ? ", exhaustive\n"
@@ -196,7 +196,7 @@ int makeUnitVectors(const CLI::App& command, UnitVectors vectors)
     for (const units::Number unit : vectors.units) {
         const units::Description made = writeTables(unit, vectors);
         base::writeFile(vectors.folder + '/' + descriptionName(unit), textOf(made));
-        text += summaryOf(made);
+        text += unitSummary(made);
     }
     print(text);
     return success;

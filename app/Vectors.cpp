@@ -32,7 +32,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct VectorsOptions {
     std::string output;
     std::string checked;
     DecoderOptions decoder;
@@ -45,7 +45,7 @@ struct Options {
 };
 
 /// What the random blocks are, as options that each follow a blank.
-std::string blockText(const Options& options)
+std::string blockText(const VectorsOptions& options)
 {
     const vectors::Settings& settings = options.settings;
     if (settings.transport.empty()) {
@@ -56,7 +56,7 @@ std::string blockText(const Options& options)
     return commandOf(options.link);
 }
 
-std::string noiseText(const Options& options)
+std::string noiseText(const VectorsOptions& options)
 {
     if (options.milliEsn0) {
         return " --esn0 " + base::thousandthsText(*options.milliEsn0);
@@ -66,7 +66,7 @@ std::string noiseText(const Options& options)
 }
 
 /// The command that makes the set again, without the folder.
-std::string commandOf(const Options& options, const vectors::Settings& settings)
+std::string commandOfSet(const VectorsOptions& options, const vectors::Settings& settings)
 {
     const auto itself = [](const std::string& text) {
         return text;
@@ -110,7 +110,7 @@ std::string comparedText(const vectors::Compared& compared)
 }
 
 /// How transport blocks are sent, and in which noise. Throws base::Error for options that cannot be met.
-std::vector<simulation::Point> transportOf(const Options& options)
+std::vector<simulation::Point> transportOf(const VectorsOptions& options)
 {
     const bool hasTransportBlocks = options.link.hasTransportBlocks();
     if (!hasTransportBlocks &&
@@ -146,7 +146,7 @@ std::vector<simulation::Point> transportOf(const Options& options)
     return points;
 }
 
-int make(Options options)
+int make(VectorsOptions options)
 {
     options.settings.transport = transportOf(options);
     options.settings.milliDecibels = options.milliEbn0.value_or(options.settings.milliDecibels);
@@ -159,7 +159,7 @@ int make(Options options)
         throw base::Error("--blocks 0 and --no-directed together leave no block");
     }
     checkCoverOptions(options.situations, manifest.settings);
-    manifest.command = commandOf(options, manifest.settings);
+    manifest.command = commandOfSet(options, manifest.settings);
     coverage::Counts counts;
     const vectors::Manifest made =
         vectors::makeSet(options.output, manifest, options.situations.isCounted ? &counts : nullptr);
@@ -189,7 +189,7 @@ int checkSet(const std::string& path)
 }
 
 /// Checks the set of a folder, its tables of units, or both.
-int check(const std::string& path)
+int checkFolder(const std::string& path)
 {
     const bool hasUnits = !units::unitsIn(path).empty();
     std::error_code ignored;  // checkSet() tells what is wrong
@@ -198,7 +198,7 @@ int check(const std::string& path)
     return hasUnits ? std::max(ofSet, checkUnitVectors(path)) : ofSet;
 }
 
-int makeUnits(const CLI::App& command, const Options& options)
+int makeUnits(const CLI::App& command, const VectorsOptions& options)
 {
     UnitVectors units = options.units;
     units.folder = options.output;
@@ -220,11 +220,11 @@ void expectNoOtherThanCheck(const CLI::App& command)
     }
 }
 
-int run(const CLI::App& command, const Options& options)
+int runVectors(const CLI::App& command, const VectorsOptions& options)
 {
     if (!options.checked.empty()) {
         expectNoOtherThanCheck(command);
-        return check(options.checked);
+        return checkFolder(options.checked);
     }
     if (!options.units.units.empty()) {
         return makeUnits(command, options);
@@ -251,7 +251,7 @@ CLI::Option* addNoise(CLI::App& command,
         ->type_name("X");
 }
 
-void addBlockOptions(CLI::App& command, Options& options)
+void addVectorsBlockOptions(CLI::App& command, VectorsOptions& options)
 {
     vectors::Settings& settings = options.settings;
     addListOption(command, "--block-size", settings.blockSizes, appendBlockSize, "Block size K in bits")
@@ -312,7 +312,7 @@ void addFileOptions(CLI::App& command, vectors::Settings& settings)
     command.add_flag("--internal", settings.internal, "Add every value of each pass to the expected values");
 }
 
-constexpr char explanation[] =
+constexpr char vectorsExplanation[] =
     R"(The folder gets the tables 'blocks', 'stimulus' and 'expected', one file for each format, and
 manifest.json with all parameters and the SHA-256 of each file. Random blocks come first, then
 directed ones: extreme values, ties, sizes at which the division into segments and windows
@@ -338,7 +338,7 @@ Example: words for $readmemh, and a check of them
 Command addVectors(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("vectors", "Make stimulus and expected values for a test bench");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<VectorsOptions>();
     auto* output =
         command
             ->add_option("--out", options->output, "Write a new set of vectors to this folder; replaces an earlier one")
@@ -346,14 +346,14 @@ Command addVectors(CLI::App& app)
     command->add_option("--check", options->checked, "Decode or compute what is in this folder again, and compare")
         ->type_name("DIR")
         ->excludes(output);
-    addBlockOptions(*command, *options);
+    addVectorsBlockOptions(*command, *options);
     addCoverOptions(*command, options->situations, options->settings);
     addDecoderOptions(*command, options->decoder);
     addFileOptions(*command, options->settings);
     addUnitOptions(*command, options->units);
-    command->footer(explanation);
+    command->footer(vectorsExplanation);
     const auto work = [options, command] {
-        return run(*command, *options);
+        return runVectors(*command, *options);
     };
     return {command, work};
 }

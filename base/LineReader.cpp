@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::size_t usualBuffer = 8192;
 
-std::string placeOf(const std::string& name, std::size_t line)
+std::string lineName(const std::string& name, std::size_t line)
 {
     return name + ':' + std::to_string(line);
 }
@@ -30,7 +30,7 @@ bool LineReader::next()
 {
     const std::size_t length = readLine();
     if (itsInput.bad()) {
-        throw fileError(placeOf(itsName, itsNumber + 1), "read");
+        throw fileError(lineName(itsName, itsNumber + 1), "read");
     }
     itsText = std::string_view(itsBuffer.data(), length);
     if (itsNumber == 0) {
@@ -54,7 +54,7 @@ bool LineReader::next()
 
 std::string LineReader::place() const
 {
-    return placeOf(itsName, std::max<std::size_t>(itsNumber, 1));
+    return lineName(itsName, std::max<std::size_t>(itsNumber, 1));
 }
 
 void LineReader::expectAnEnd(std::size_t first) const
@@ -82,7 +82,7 @@ void LineReader::fail(const std::string& what) const
 
 void LineReader::failAt(std::size_t line, const std::string& what) const
 {
-    throw Error(placeOf(itsName, line) + ": " + what);
+    throw Error(lineName(itsName, line) + ": " + what);
 }
 
 /// Reads a line into the buffer and returns its length. Reads only as much of an overlong line as shows that it is.

@@ -2,6 +2,7 @@
 #ifndef MORVIK_BASE_TEXT_H
 #define MORVIK_BASE_TEXT_H
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <string>
@@ -37,6 +38,12 @@ inline std::string plural(const std::string& noun, std::uint64_t count)
 inline std::string counted(std::uint64_t count, const std::string& noun)
 {
     return std::to_string(count) + ' ' + plural(noun, count);
+}
+
+/// The text behind blanks, `width` characters in all.
+inline std::string rightAligned(const std::string& text, std::size_t width)
+{
+    return std::string(width - std::min(width, text.size()), ' ') + text;
 }
 
 /// Lists ascending numbers by their names, neighbours as a range: "2 to 15", "alpha0 to alpha7, llr".

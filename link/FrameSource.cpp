@@ -2,12 +2,12 @@
 #include "FrameSource.h"
 
 #include <algorithm>
-#include <cmath>
 #include <stdexcept>
 #include <string>
 
 #include "link/channel/Channel.h"
 #include "link/coding/PackedBits.h"
+#include "link/coding/SoftValues.h"
 #include "link/random/GaussianNumber.h"
 #include "rules/Tail.h"
 
@@ -21,14 +21,6 @@ int checkedMilliDecibels(int milliDecibels)
         throw std::invalid_argument("an Eb/N0 of " + std::to_string(milliDecibels) + " thousandths of a decibel");
     }
     return milliDecibels;
-}
-
-double checkedScale(double scale)
-{
-    if (!(scale > 0) || !std::isfinite(scale)) {
-        throw std::invalid_argument("a scale of " + std::to_string(scale));
-    }
-    return scale;
 }
 
 }  // namespace

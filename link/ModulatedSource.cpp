@@ -2,9 +2,6 @@
 #include "ModulatedSource.h"
 
 #include <algorithm>
-#include <cmath>
-#include <stdexcept>
-#include <string>
 
 #include "RandomBits.h"
 #include "link/coding/SoftValues.h"
@@ -20,20 +17,12 @@ RandomKey pointKey(unsigned K, const SymbolFormat& format, std::uint64_t seed)
     return derivedKey(randomKey(seed), K, keyWordOf(format));
 }
 
-float checkedScale(double scale)
-{
-    if (!(scale > 0) || !std::isfinite(scale)) {
-        throw std::invalid_argument("a scale of " + std::to_string(scale));
-    }
-    return static_cast<float>(scale);
-}
-
 }  // namespace
 
 ModulatedSource::ModulatedSource(
     unsigned K, const SymbolFormat& format, double scale, std::uint64_t seed, const SamplerForm& form)
     : itsK(K),
-      itsScale(checkedScale(scale)),
+      itsScale(static_cast<float>(checkedScale(scale))),
       itsKey(pointKey(K, format, seed)),
       itsRandomBits(itsKey, form),
       itsEncoder(K),

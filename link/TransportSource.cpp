@@ -2,7 +2,6 @@
 #include "TransportSource.h"
 
 #include <algorithm>
-#include <cmath>
 #include <stdexcept>
 #include <string>
 
@@ -33,9 +32,7 @@ TransportSetting checked(const TransportSetting& setting)
         }
     }
     for (const double scale : setting.scales) {
-        if (!(scale > 0) || !std::isfinite(scale)) {
-            throw std::invalid_argument("a scale of " + std::to_string(scale));
-        }
+        checkedScale(scale);
     }
     if (setting.versions.empty() || setting.scales.size() != setting.versions.size()) {
         throw std::invalid_argument("as many scales as transmissions");

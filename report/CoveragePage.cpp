@@ -15,7 +15,7 @@ namespace morvik::report {
 
 namespace {
 
-constexpr char title[] = "Situations of the arithmetic";
+constexpr char coverageTitle[] = "Situations of the arithmetic";
 
 const char* kindOf(const CoverageRow& row)
 {
@@ -100,8 +100,8 @@ void writeCoveragePage(const std::string& fileName, const CoverageDescription& c
             "<meta http-equiv=\"Content-Security-Policy\" content=\"default-src 'none'; style-src 'unsafe-inline'; "
             "base-uri 'none'; form-action 'none'\">\n"
             "<meta name=\"viewport\" content=\"width=device-width, initial-scale=1\">\n<title>"
-         << title << "</title>\n<style>\n"
-         << pageStyle << coverageStyle << "</style>\n</head>\n<body>\n<main>\n<h1>" << title
+         << coverageTitle << "</title>\n<style>\n"
+         << pageStyle << coverageStyle << "</style>\n</head>\n<body>\n<main>\n<h1>" << coverageTitle
          << "</h1>\n<p class=\"lead\">" << escaped(coverage.lead) << "</p>\n";
     writeTable(page, coverage.rows);
     writeCores(page, coverage);

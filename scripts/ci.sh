@@ -120,11 +120,13 @@ stage_memory-short() {
     local long=(BerRuns Faults/FaultyCore Stages/Mistakes Coverage.IsWholeInASet SelfCheck.FindsTheLibraryRight
         SelfCheck.Notices{TheLast,Another,Other} VcdDump.RefusesTimesAndChangesWithoutAnEnd
         Vectors.{ChecksCasesOfUnits,WritesWhatDecodeReads} Sizes/ModelValues.FollowFromEachOther/{2560,6144}
-        Trace.NeedsNoMore DefaultScale.HalfAnd)
-    long+=(Diagnosis.{BlamesNoiseAlone,TakesNoChance,Finds{EachMistake,PairsOf,NothingIn,TheTails,AMissingOr}}
-        ChainDiagnosis.{BlamesNoiseAlone,TakesNoChance,NamesNoMistakeThat}
+        Trace.NeedsNoMore DefaultScale.HalfAnd Situations.AreCountedAs FrameSource.DrawsWhat VectorSet.IsAsTheModelDecodesWithAll
+        BerLink.GoesOnUntil Compare.{AgreesWithTheTrace,TellsThatADump,TellsWhichCore} CodeBlocksTest.AgreesWithTheClause)
+    long+=(Diagnosis.{BlamesNoiseAlone,TakesNoChance,Finds{EachMistake,PairsOf,NothingIn,TheTails,AMissingOr,AScaleBeside}}
+        ChainDiagnosis.{BlamesNoiseAlone,TakesNoChance,NamesNoMistakeThat,TellsWhenBits}
         ChainDiagnosis.Finds{EachMistake,PairsOf,NothingIn,TheSoftBuffer,MistakesBy,Scales})
-    local scripts=(example_set example_sweep core_from_document default_core regression same_results same_vectors)
+    local scripts=(example_set example_sweep core_from_document default_core regression report_in_browser same_results same_vectors
+        waveforms)
     memory_without "${long[@]}" "${scripts[@]/%/$}"
 }
 

@@ -4,7 +4,13 @@ import re
 
 # A type, an alias, a constant or a function that begins at the start of a line. Names of capital letters are macros.
 DEFINITION = re.compile(r"^(?:(?:struct|class|enum class|enum) (\w+)|using (?!namespace)(?:\w+::)*(\w+)"
-                        r"|const(?:expr)? .*?(\w+)(?: =|[{[(])|\w[^;=\n]*?(?<!::)\b(?![A-Z_]+\()(\w+)\([^;\n]*$)", re.MULTILINE)
+                        r"|const(?:expr)? .*?(\w+)(?: =|[{[(])|\w[^;=\n]*?(?<!::)\b(?![A-Z_]+\(|its[A-Z])(\w+)\([^;\n]*$)", re.MULTILINE)
+
+# Where programs start.
+STARTS = {"main", "sc_main"}
+
+# A name of another namespace.
+BROUGHT = re.compile(r"^using ((?:\w+::)+(\w+));", re.MULTILINE)
 
 NAMESPACE = re.compile("^using namespace .*", re.MULTILINE)
 
@@ -22,11 +28,14 @@ def names_of(pattern, text):
 
 
 class Names:
-    """The names that a source defines, those of them that no other source sees, and those that it uses."""
+    """The names that a source defines, those of them that no other source sees, where those are from that it brings from
+    another namespace, those that it uses, and the namespaces whose names it uses unqualified."""
 
     def __init__(self, text):
+        self.namespaces = set(NAMESPACE.findall(text))
         self.defined = names_of(DEFINITION, text)
         self.own = names_of(DEFINITION, "".join(OWN.findall(text)))
+        self.brought = {name: path for path, name in BROUGHT.findall(text)}
         self.used = names_of(USE, text)
 
 
@@ -36,25 +45,34 @@ class Unit:
     def __init__(self, kind):
         self.kind = kind
         self.sources = []
+        self.namespaces = set()
         self.defined = set()
         self.own = set()
+        self.brought = {}
 
     def takes(self, kind, names):
-        return self.kind == kind and not self.defined & names.defined and not self.own & names.used
+        # What both define for all to see are functions of different arguments.
+        clash = self.own & (names.defined | names.used) | self.defined & names.own
+        clash = {name for name in clash if name not in self.brought or self.brought[name] != names.brought.get(name)}
+        clash |= self.defined & names.defined & STARTS
+        alike = not self.namespaces or not names.namespaces or self.namespaces == names.namespaces
+        return self.kind == kind and alike and not clash
 
     def add(self, source, names):
         self.sources.append(source)
+        self.namespaces |= names.namespaces
         self.defined |= names.defined
         self.own |= names.own
+        self.brought.update(names.brought)
 
 
 def units_of(sources, kind_of, largest):
     """Units of up to `largest` of the paths `sources`; those of a unit have one kind in common, which the function `kind_of`
-    tells, and what they use of namespaces."""
+    tells, and use no two sets of namespaces."""
     units = []
     for source in sources:
         text = COMMENT_OR_TEXT.sub("", source.read_text())
-        kind = kind_of(source), sorted(NAMESPACE.findall(text))
+        kind = kind_of(source)
         names = Names(text)
         unit = next((unit for unit in units if len(unit.sources) < largest and unit.takes(kind, names)), None)
         if not unit:

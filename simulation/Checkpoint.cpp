@@ -37,7 +37,7 @@ Json jsonOf(const Reception& reception)
             {"iterations", reception.iterations}};
 }
 
-Reception receptionOf(const JsonMembers& members)
+Reception readReception(const JsonMembers& members)
 {
     return {members.integer("code_block_errors", 0, UINT64_MAX),
             members.integer("undetected_errors", 0, UINT64_MAX),
@@ -80,7 +80,7 @@ ErrorCounts countsOf(const Json& json, const std::string& place)
         counts.failures.push_back(frame.get<std::uint64_t>());
     }
     if (members.has("reception")) {
-        counts.reception = receptionOf({members.at("reception"), place + ": reception"});
+        counts.reception = readReception({members.at("reception"), place + ": reception"});
     }
     return counts;
 }
@@ -103,7 +103,7 @@ PointResult pointOf(const Json& json, const std::string& place)
     return point;
 }
 
-std::vector<PointResult> pointsOf(const JsonMembers& members, const std::string& name, const std::string& fileName)
+std::vector<PointResult> readPoints(const JsonMembers& members, const std::string& name, const std::string& fileName)
 {
     const std::string place = fileName + ": " + name + ' ';
     std::vector<PointResult> points;
@@ -157,8 +157,8 @@ std::optional<Checkpoint> parseCheckpoint(const std::string& text, const std::st
     Checkpoint checkpoint;
     checkpoint.version = members.text("version");
     checkpoint.command = members.text("command");
-    checkpoint.ended = pointsOf(members, "ended", fileName);
-    checkpoint.begun = pointsOf(members, "begun", fileName);
+    checkpoint.ended = readPoints(members, "ended", fileName);
+    checkpoint.begun = readPoints(members, "begun", fileName);
     if (members.has("running")) {
         checkpoint.running = pointOf(members.at("running"), fileName + ": running");
     }

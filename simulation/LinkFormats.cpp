@@ -15,7 +15,7 @@ namespace morvik::simulation {
 
 namespace {
 
-std::string rateText(double rate)
+std::string codeRateText(double rate)
 {
     return base::numberText(rate, std::chars_format::fixed, 3);
 }
@@ -93,7 +93,7 @@ void checkRate(const LinkFormat& format, const std::string& what, const std::str
     }
     const auto transmissions = format.versions.size();
     throw base::Error(what + ": the code rate with CRCs is " +
-                      rateText(effectiveRate(format) / static_cast<double>(transmissions)) +
+                      codeRateText(effectiveRate(format) / static_cast<double>(transmissions)) +
                       (transmissions > 1 ? " after " + std::to_string(transmissions) + " transmissions" : "") +
                       ", above 1; " + least);
 }

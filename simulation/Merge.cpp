@@ -20,7 +20,7 @@ struct JoinedRow {
     const std::string* file = nullptr;
 };
 
-std::string nameOf(const Point& point)
+std::string descriptionOf(const Point& point)
 {
     return curveText(point) + ", " + placeText(point);
 }
@@ -67,8 +67,8 @@ private:
 void join(const Part& part, const ResultRow& row, JoinedRow& joined)
 {
     if (!joined.row.frames.join(row.frames)) {
-        throw base::Error(part.fileName + ": has frames that " + *joined.file + " has, too: " + nameOf(row.point) +
-                          ", frames " + row.frames.text());
+        throw base::Error(part.fileName + ": has frames that " + *joined.file +
+                          " has, too: " + descriptionOf(row.point) + ", frames " + row.frames.text());
     }
     ErrorCounts& errors = joined.row.errors;
     const bool isTooMuch = row.errors.bitErrorSquares > UINT64_MAX - errors.bitErrorSquares;
@@ -77,7 +77,7 @@ void join(const Part& part, const ResultRow& row, JoinedRow& joined)
     joined.row.seconds += row.seconds;
     if (isTooMuch || joined.row.frames.size() > mostBlocks) {
         throw base::Error(part.fileName + ": has more errors or blocks, together with " + *joined.file +
-                          ", than can be counted: " + nameOf(row.point));
+                          ", than can be counted: " + descriptionOf(row.point));
     }
 }
 

@@ -170,7 +170,7 @@ bool areResultsOf(const Plan& plan, const std::vector<PointResult>& points, cons
 
 /// The points of a run that ends with these results, or has been stopped with them: then the last ones have no blocks.
 /// Nothing if the results are not of this run.
-std::optional<std::vector<PointResult>> pointsOf(const Plan& plan, const Results& results)
+std::optional<std::vector<PointResult>> countedPoints(const Plan& plan, const Results& results)
 {
     Rows rows;
     for (const ResultRow& row : results.rows) {
@@ -218,7 +218,7 @@ Standing standingOf(const Plan& plan, const Checkpoint& checkpoint, const std::s
 Standing standingOf(const Plan& plan, const Results& results, const std::string& fileName)
 {
     const std::string obstacle = obstacleIn(results.command, plan);
-    const auto points = pointsOf(plan, results);
+    const auto points = countedPoints(plan, results);
     if (!obstacle.empty() || !points) {
         throw base::Error(fileName + ": holds other results" + (obstacle.empty() ? "" : " (" + obstacle + ')') +
                           ", and there is no checkpoint to resume; --overwrite starts anew");

@@ -160,7 +160,7 @@ int ber(const BerMeans& means, const BerOptions& options)
 }
 
 /// The end of the help text.
-constexpr char explanation[] =
+constexpr char berExplanation[] =
     R"(Simulates every combination of the options that take lists: plain code blocks, with BPSK over
 white Gaussian noise unless another modulation or channel is named, or transport blocks of
 3GPP TS 36.212. Eb/N0 counts tail and CRCs as energy, not as information. The same seed gives the same
@@ -187,7 +187,7 @@ Command addBer(CLI::App& app, const BerMeans& means)
     CLI::App* command = app.add_subcommand("ber", "Simulate bit and block error rates");
     const auto options = std::make_shared<BerOptions>();
     addBerOptions(*command, *options);
-    command->footer(explanation);
+    command->footer(berExplanation);
     const auto run = [means, options] {
         return ber(means, *options);
     };

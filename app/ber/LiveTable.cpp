@@ -89,7 +89,7 @@ std::string headLine(bool eachIteration, const Point& point)
     return line.text();
 }
 
-Line lineOf(const ResultRow& row, bool eachIteration)
+Line tableLine(const ResultRow& row, bool eachIteration)
 {
     const std::uint64_t blocks = row.frames.size();
     const auto bounds = simulation::blockErrorBounds(row.errors, blocks);
@@ -144,7 +144,7 @@ void LiveTable::isAt(const PointResult& running)
     }
     itsLastMove = now;
     writeHeading(itsPlan.points[running.number]);
-    Line line = lineOf(resultsOf(itsPlan, {running}).rows.back(), itsPlan.eachIteration);
+    Line line = tableLine(resultsOf(itsPlan, {running}).rows.back(), itsPlan.eachIteration);
     line.bounds = timeLeft(itsPlan, running);
     std::string text = line.text();
     text.resize(std::min(text.size(), *itsWidth - 1));  // a cursor past the last column would wrap
@@ -157,7 +157,7 @@ void LiveTable::hasEnded(const PointResult& point)
     eraseMovingLine();
     writeHeading(itsPlan.points[point.number]);
     for (const ResultRow& row : resultsOf(itsPlan, {point}).rows) {
-        write(lineOf(row, itsPlan.eachIteration).text() + '\n');
+        write(tableLine(row, itsPlan.eachIteration).text() + '\n');
     }
 }
 

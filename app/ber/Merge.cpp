@@ -16,14 +16,14 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct MergeOptions {
     std::vector<std::string> inputs;
     std::string output;
     PictureOptions pictures;
 };
 
 /// Writes the results to a file or, if no other output is requested, as CSV to standard output.
-void write(const Options& options, const simulation::Results& results)
+void write(const MergeOptions& options, const simulation::Results& results)
 {
     if (!options.output.empty()) {
         simulation::writeResults(options.output, results);
@@ -51,7 +51,7 @@ std::vector<simulation::Point> pointsOf(const simulation::Results& results)
     return points;
 }
 
-int merge(const Options& options)
+int merge(const MergeOptions& options)
 {
     Pictures pictures(options.pictures, options.output, options.inputs);
     std::vector<simulation::Part> parts;
@@ -71,7 +71,7 @@ int merge(const Options& options)
 }
 
 /// The end of the help text.
-constexpr char explanation[] =
+constexpr char mergeExplanation[] =
     R"(The runs have the same seed and were made by the same version. Rows of the same parameters
 become one, if they have no frames in common: 'morvik ber --frames' divides them. One
 file alone is drawn as it is.
@@ -88,7 +88,7 @@ Example: two halves of a simulation, made anywhere
 Command addMerge(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("merge", "Join the results of 'morvik ber' for different frames");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<MergeOptions>();
     command->add_option("FILE", options->inputs, "Results, as CSV or JSON")->required()->type_name("");
     command
         ->add_option("--output",
@@ -96,7 +96,7 @@ Command addMerge(CLI::App& app)
                      "File for all of them, .csv or .json; CSV goes to standard output if nothing is named")
         ->type_name("FILE");
     addPictureOptions(*command, options->pictures);
-    command->footer(explanation);
+    command->footer(mergeExplanation);
     const auto run = [options] {
         return merge(*options);
     };

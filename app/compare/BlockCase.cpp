@@ -16,7 +16,7 @@ namespace morvik {
 namespace {
 
 /// "3 differences, 1 fault; the first is alpha0 of half-iteration 2, step 64".
-std::string summaryOf(const comparison::Comparison& found, const comparison::Coverage& coverage, Verdict verdict)
+std::string blockSummary(const comparison::Comparison& found, const comparison::Coverage& coverage, Verdict verdict)
 {
     if (verdict == Verdict::equal) {
         return std::to_string(found.compared()) + " values, all equal to the model";
@@ -40,7 +40,7 @@ std::vector<std::string> otherRunsOf(const BlockCase& block,
                                                                           : std::vector<std::string>();
 }
 
-coverage::CoreCounts situationsOf(const comparison::Model& model, const comparison::Values& values)
+coverage::CoreCounts situationsOfBlock(const comparison::Model& model, const comparison::Values& values)
 {
     return coverage::countsAt(
         model, [&](const comparison::Place& place) { return values.at(place) == model.values.at(place); });
@@ -95,13 +95,13 @@ CaseResult compareCase(const BlockCase& block,
     const comparison::Coverage coverage = comparison::coverageOf(model, dump);
     const bool isWhole = coverage.isComplete() || options.partial;
     result.verdict = found.first ? Verdict::different : isWhole ? Verdict::equal : Verdict::incomplete;
-    result.summary = summaryOf(found, coverage, result.verdict);
+    result.summary = blockSummary(found, coverage, result.verdict);
     comparison::Report report = comparison::reportOf(
         {found, coverage, model, dump, dumpName, options.partial, otherRunsOf(block, found, dump.values)});
     result.report = std::move(report.text);
     result.findings = std::move(report.findings);
     if (options.countsSituations()) {
-        result.situations = situationsOf(model, dump.values);
+        result.situations = situationsOfBlock(model, dump.values);
     }
     return result;
 }

@@ -61,7 +61,7 @@ ComparedSet compareBlock(const CompareOptions& options, const comparison::NameMa
 }
 
 /// The report of a single block, or the first report of many and a summary.
-std::string textOf(const std::vector<ComparedSet>& sets)
+std::string setsText(const std::vector<ComparedSet>& sets)
 {
     if (sets.size() == 1 && sets.front().results.size() == 1) {
         return "core: " + sets.front().core + '\n' + sets.front().results.front().report;
@@ -79,7 +79,7 @@ std::string textOf(const std::vector<ComparedSet>& sets)
 }
 
 /// That of the worst result.
-int statusOf(const std::vector<ComparedSet>& sets)
+int exitStatus(const std::vector<ComparedSet>& sets)
 {
     int worst = success;
     for (const ComparedSet& set : sets) {
@@ -142,14 +142,14 @@ int compare(const CLI::App& command, const CompareOptions& options)
     if (!options.junit.empty()) {
         base::writeFile(options.junit, junitText(sets));
     }
-    std::string text = textOf(sets);
+    std::string text = setsText(sets);
     if (!options.coverage.empty()) {
         const coverage::Counts counts = situationsOf(sets);
         base::writeFile(options.coverage, coverage::textOf(counts));
         text += "\nsituations: " + coverage::summary(counts) + '\n';
     }
     print(text);
-    return statusOf(sets);
+    return exitStatus(sets);
 }
 
 constexpr char explanationBeforeSignals[] =

@@ -103,18 +103,13 @@ std::vector<std::pair<std::string, std::size_t>> mistakesOf(const std::vector<Co
     return sorted;
 }
 
-std::string padded(const std::string& text, std::size_t width)
-{
-    return std::string(width - std::min(width, text.size()), ' ') + text;
-}
-
 std::string signalTable(const std::vector<ComparedSet>& sets)
 {
     const auto row = [](const std::string& name, const std::array<std::string, 6>& fields) {
         constexpr std::array<std::size_t, 6> widths = {14, 10, 10, 13, 10, 8};
         std::string text = name + std::string(10 - name.size(), ' ');
         for (std::size_t i = 0; i < fields.size(); ++i) {
-            text += padded(fields[i], widths[i]);
+            text += base::rightAligned(fields[i], widths[i]);
         }
         return text + '\n';
     };

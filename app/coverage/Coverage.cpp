@@ -25,7 +25,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct CoverageOptions {
     std::vector<std::string> inputs;
     std::string output;
     std::string report;
@@ -35,33 +35,33 @@ struct Options {
     bool list = false;
 };
 
-std::string textOf(const coverage::Core& core)
+std::string coreText(const coverage::Core& core)
 {
     return std::to_string(core.units) + " units, " + std::string(rules::algorithmNames.at(core.algorithm));
 }
 
-std::string padded(std::string text, std::size_t width)
+std::string leftAligned(std::string text, std::size_t width)
 {
     text.resize(std::max(text.size(), width), ' ');
     return text;
 }
 
 /// A line for a situation.
-std::string lineOf(const coverage::Situation& situation, const std::string& count)
+std::string situationLine(const coverage::Situation& situation, const std::string& count)
 {
     constexpr std::size_t widestRule = 3;
     constexpr std::size_t widestName = 28;
     constexpr std::size_t widestCount = 10;
-    return padded("", widestRule - std::to_string(situation.rule).size()) + std::to_string(situation.rule) + "  " +
-           padded(situation.name, widestName) + (count.empty() ? "" : padded(count, widestCount)) + situation.text +
-           '\n';
+    return leftAligned("", widestRule - std::to_string(situation.rule).size()) + std::to_string(situation.rule) + "  " +
+           leftAligned(situation.name, widestName) + (count.empty() ? "" : leftAligned(count, widestCount)) +
+           situation.text + '\n';
 }
 
 std::string listText()
 {
     std::string text;
     for (const coverage::Situation& each : coverage::situations()) {
-        text += lineOf(each, "");
+        text += situationLine(each, "");
     }
     return text;
 }
@@ -87,11 +87,11 @@ std::string impossibleText(const coverage::Counts& counts)
     return text;
 }
 
-std::string textOf(const coverage::Counts& counts, bool all)
+std::string countsText(const coverage::Counts& counts, bool all)
 {
     std::string text;
     for (const coverage::CoreCounts& each : counts.cores()) {
-        text += "core: " + textOf(each.core) + "; " + base::counted(each.blocks, "block") + '\n';
+        text += "core: " + coreText(each.core) + "; " + base::counted(each.blocks, "block") + '\n';
     }
     constexpr std::size_t none = 0;
     text += "situations: " + coverage::summary(counts, none) + '\n';
@@ -99,13 +99,13 @@ std::string textOf(const coverage::Counts& counts, bool all)
         const bool isPossible = !counts.whyImpossible(number);
         if (isPossible && (all || counts.met(number) == 0)) {
             const std::string count = counts.met(number) == 0 ? "missing" : std::to_string(counts.met(number));
-            text += lineOf(coverage::situations()[number], count);
+            text += situationLine(coverage::situations()[number], count);
         }
     }
     return text + impossibleText(counts);
 }
 
-std::string jsonOf(const coverage::Counts& counts)
+std::string jsonText(const coverage::Counts& counts)
 {
     nlohmann::ordered_json object = {{"version", MORVIK_VERSION}};
     object.update(countsJson(counts));
@@ -117,7 +117,7 @@ void writePage(const std::string& fileName, const coverage::Counts& counts)
     report::CoverageDescription page;
     page.lead = coverage::summary(counts, 0) + ", in " + base::counted(counts.blocks(), "block");
     for (const coverage::CoreCounts& each : counts.cores()) {
-        page.cores.emplace_back(textOf(each.core), each.blocks);
+        page.cores.emplace_back(coreText(each.core), each.blocks);
     }
     for (unsigned number = 0; number < coverage::situations().size(); ++number) {
         const coverage::Situation& each = coverage::situations()[number];
@@ -153,7 +153,7 @@ std::vector<std::string> filesOf(const std::vector<std::string>& inputs)
     return files;
 }
 
-int run(const Options& options)
+int reportCoverage(const CoverageOptions& options)
 {
     if (options.list) {
         if (!options.inputs.empty() || !options.output.empty() || !options.report.empty() || options.all ||
@@ -182,11 +182,11 @@ int run(const Options& options)
     if (!options.report.empty()) {
         writePage(options.report, counts);
     }
-    print(options.json ? jsonOf(counts) : options.missing ? missingText(counts) : textOf(counts, options.all));
+    print(options.json ? jsonText(counts) : options.missing ? missingText(counts) : countsText(counts, options.all));
     return counts.missing().empty() ? success : differencesFound;
 }
 
-constexpr char explanation[] =
+constexpr char coverageExplanation[] =
     R"(A file is one that 'morvik vectors --coverage' or a checker in a simulator has written, or the folder
 of a set of vectors. All are summed. A situation counts as missing if one of the cores can meet it and
 none has. docs/coverage.md tells what the situations are.
@@ -204,7 +204,7 @@ Command addCoverage(CLI::App& app)
 {
     CLI::App* command =
         app.add_subcommand("coverage", "Tell which situations of the arithmetic sets and simulations have met");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<CoverageOptions>();
     command->add_option("FILE", options->inputs, "Counts, or folders of vectors")->type_name("");
     command->add_option("--output", options->output, "Write the sums to this file, as CSV")->type_name("FILE");
     command->add_option("--report", options->report, "Draw the sums as an HTML page")->type_name("FILE");
@@ -216,9 +216,9 @@ Command addCoverage(CLI::App& app)
                    "Print the names of missing situations alone, as --cover of 'morvik vectors' takes them")
         ->excludes(all, json);
     command->add_flag("--list", options->list, "Print all situations, and what they are, instead");
-    command->footer(explanation);
+    command->footer(coverageExplanation);
     const auto work = [options] {
-        return run(*options);
+        return reportCoverage(*options);
     };
     return {command, work};
 }

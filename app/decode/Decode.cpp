@@ -26,7 +26,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct DecodeOptions {
     std::string input = base::standardStream;
     std::string output = base::standardStream;
     std::optional<std::string> reference;
@@ -61,7 +61,7 @@ struct Summary {
     }
 };
 
-void print(const Summary& summary, bool withErrors)
+void printSummary(const Summary& summary, bool withErrors)
 {
     std::cerr << base::counted(summary.blocks, "block") << " of ";
     if (summary.smallest < summary.largest) {
@@ -79,7 +79,7 @@ void print(const Summary& summary, bool withErrors)
 
 /// The tag of a block. Tags after the first wrap at the width that the core carries, so that only a tag that the user
 /// gave can be truncated.
-std::uint32_t tagOf(std::uint32_t block, const Options& options)
+std::uint32_t tagOf(std::uint32_t block, const DecodeOptions& options)
 {
     const auto width = static_cast<std::uint32_t>(options.decoder.generics.C_TAG_WIDTH);
     const std::uint32_t carried = (std::uint32_t{1} << (width % 32)) - 1;
@@ -118,7 +118,7 @@ try {
     throw;
 }
 
-void decodeBlocks(const Options& options,
+void decodeBlocks(const DecodeOptions& options,
                   SoftValueReader& reader,
                   std::optional<ReferenceBits>& reference,
                   base::OutputFile& output,
@@ -152,7 +152,7 @@ void decodeBlocks(const Options& options,
     output.commit();
 }
 
-int decode(const Options& options)
+int decode(const DecodeOptions& options)
 {
     StimulusFile input(options.input);
     SoftValueReader reader(input.stream(), input.name());
@@ -172,11 +172,11 @@ int decode(const Options& options)
         reference->expectEnd();
     }
     std::cerr << coreLine(options.decoder.generics, options.decoder.iterations);
-    print(summary, reference.has_value());
+    printSummary(summary, reference.has_value());
     return summary.bitErrors > 0 ? differencesFound : success;
 }
 
-TransportDecodeOptions transportOptions(const Options& options)
+TransportDecodeOptions transportOptions(const DecodeOptions& options)
 {
     TransportDecodeOptions transport = options.transport;
     transport.input = options.input;
@@ -187,7 +187,7 @@ TransportDecodeOptions transportOptions(const Options& options)
 }
 
 /// The end of the help text.
-std::string explanation()
+std::string decodeExplanation()
 {
     return std::string("FILE starts with the line ") + softValueHeader + R"(
 and has one row for each of the K + 4 positions of a block. A new number in the first
@@ -242,7 +242,7 @@ void addTransportDecodeOptions(CLI::App& command, TransportDecodeOptions& option
 Command addDecode(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("decode", "Decode blocks of soft values into bits");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<DecodeOptions>();
 
     command->add_option("FILE", options->input, "Soft values, as CSV; - for standard input")
         ->type_name("")
@@ -262,7 +262,7 @@ Command addDecode(CLI::App& app)
         ->type_name("N")
         ->capture_default_str();
     addTransportDecodeOptions(*command, options->transport);
-    command->footer(explanation());
+    command->footer(decodeExplanation());
 
     const auto run = [options] {
         return options->transport.bits > 0 ? decodeTransportBlocks(transportOptions(*options)) : decode(*options);

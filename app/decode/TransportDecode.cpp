@@ -21,7 +21,7 @@ namespace morvik {
 namespace {
 
 /// The figures of the closing line.
-struct Summary {
+struct TransportSummary {
     std::uint64_t blocks = 0;
     std::uint64_t transmissions = 0;
     std::uint64_t failures = 0;    ///< CRC
@@ -108,7 +108,7 @@ public:
     }
 
     /// After the last block.
-    const Summary& finish()
+    const TransportSummary& finish()
     {
         finishBlock();
         if (itsReference) {
@@ -138,10 +138,10 @@ private:
     std::string itsLabel;
     std::size_t itsTransmissions = 0;  // rows of this block
     std::size_t itsUsed = 0;           // those until its CRC fitted
-    Summary itsSummary;
+    TransportSummary itsSummary;
 };
 
-std::string textOf(const Summary& summary, const TransportDecodeOptions& options)
+std::string transportSummaryText(const TransportSummary& summary, const TransportDecodeOptions& options)
 {
     std::ostringstream line;
     line << base::counted(summary.blocks, "transport block") << " of " << options.bits << " bits in "
@@ -187,12 +187,13 @@ int decodeTransportBlocks(const TransportDecodeOptions& options)
         reception.commit();  // what was decided before the error
         throw;
     }
-    const Summary& summary = reception.finish();
+    const TransportSummary& summary = reception.finish();
     reception.commit();
     if (summary.blocks == 0) {
         rows.fail("no rows after the header, expected at least one transmission");
     }
-    std::cerr << coreLine(options.decoder.generics, options.decoder.iterations) << textOf(summary, options);
+    std::cerr << coreLine(options.decoder.generics, options.decoder.iterations)
+              << transportSummaryText(summary, options);
     return summary.failures > 0 || summary.bitErrors > 0 ? differencesFound : success;
 }
 

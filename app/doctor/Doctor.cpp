@@ -24,7 +24,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct DoctorOptions {
     std::string input = base::standardStream;
     std::string reference;
     std::uint32_t blocks = 16;
@@ -45,12 +45,12 @@ void check(const diagnosis::Case& read, const SoftValueReader& blocks, const Ref
     }
 }
 
-struct Cases {
+struct BlockCases {
     std::vector<diagnosis::Case> cases;
     bool hasMore = false;  ///< the file has more blocks
 };
 
-Cases readCases(const Options& options)
+BlockCases readCases(const DoctorOptions& options)
 {
     base::InputFile input(options.input);
     base::InputFile referenceFile(options.reference);
@@ -70,10 +70,10 @@ Cases readCases(const Options& options)
     return {std::move(cases), blocks.hasMore()};
 }
 
-int examine(const Options& options)
+int examine(const DoctorOptions& options)
 {
     base::expectOwnFile(base::standardStream, {options.input, options.reference}, "findings");
-    const Cases read = readCases(options);
+    const BlockCases read = readCases(options);
     diagnosis::Diagnosis diagnosis = diagnosis::diagnose(read.cases, options.decoder);
     diagnosis.hasMore = read.hasMore;
     const std::string core = coreLine(options.decoder.generics, options.decoder.iterations);
@@ -81,7 +81,7 @@ int examine(const Options& options)
     return statusOf(diagnosis.verdict, diagnosis.best.mistakes.count());
 }
 
-int examineTransportBlocks(const Options& options)
+int examineTransport(const DoctorOptions& options)
 {
     TransportDoctorOptions transport = options.transport;
     transport.input = options.input;
@@ -108,7 +108,7 @@ void addTransportDoctorOptions(CLI::App& command, TransportDoctorOptions& option
 Command addDoctor(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("doctor", "Find out why blocks of soft values decode badly");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<DoctorOptions>();
 
     command->add_option("FILE", options->input, "Soft values, as 'morvik decode' takes them; - for standard input")
         ->type_name("")
@@ -142,7 +142,7 @@ Example:
         }
     });
     const auto run = [options] {
-        return options->transport.bits > 0 ? examineTransportBlocks(*options) : examine(*options);
+        return options->transport.bits > 0 ? examineTransport(*options) : examine(*options);
     };
     return {command, run};
 }

@@ -21,15 +21,15 @@ namespace {
 
 constexpr int noMistakeFound = 3;  // an exit status of this subcommand only
 
-struct Cases {
+struct TransportCases {
     std::vector<diagnosis::ChainCase> cases;
     bool hasMore = false;  ///< the file has more transport blocks
 };
 
 /// Reads the first transport blocks: rows of one number stand together.
-Cases readRows(const TransportDoctorOptions& options, CodedValueReader& rows)
+TransportCases readRows(const TransportDoctorOptions& options, CodedValueReader& rows)
 {
-    Cases read;
+    TransportCases read;
     std::string label;
     while (rows.next()) {
         if (read.cases.empty() || rows.label() != label) {
@@ -53,7 +53,7 @@ Cases readRows(const TransportDoctorOptions& options, CodedValueReader& rows)
     return read;
 }
 
-void readReference(const TransportDoctorOptions& options, Cases& read)
+void readReference(const TransportDoctorOptions& options, TransportCases& read)
 {
     base::InputFile file(options.reference);
     ReferenceBits reference(
@@ -80,7 +80,7 @@ int examineTransportBlocks(const TransportDoctorOptions& options)
     base::expectOwnFile(base::standardStream, {options.input, reference}, "findings");
     base::InputFile input(options.input);
     CodedValueReader rows(input.stream(), input.name(), options.transport.codedBits);
-    Cases read = readRows(options, rows);
+    TransportCases read = readRows(options, rows);
     if (!options.reference.empty()) {
         readReference(options, read);
     }

@@ -23,7 +23,7 @@ namespace morvik {
 
 namespace {
 
-struct Options {
+struct InfoOptions {
     std::optional<std::uint32_t> K;
     bool table = false;
     bool json = false;
@@ -45,7 +45,7 @@ std::string lengthsText(const rules::Cut& cut)
     return text;
 }
 
-std::string textOf(const BlockLayout& layout)
+std::string layoutText(const BlockLayout& layout)
 {
     const std::string K = std::to_string(layout.K);
     std::string text = "K = " + K + ": " + std::to_string(layout.K + rules::tailPositions) +
@@ -69,7 +69,7 @@ std::string textOf(const BlockLayout& layout)
     return text;
 }
 
-std::string textOf(const std::vector<NumberFormat>& formats)
+std::string formatsText(const std::vector<NumberFormat>& formats)
 {
     std::string text = "numbers                   format    bits  fraction  range\n";
     for (const NumberFormat& format : formats) {
@@ -118,7 +118,7 @@ std::string tableText(const BlockLayout& layout)
 
 using Json = nlohmann::ordered_json;
 
-Json jsonOf(const rules::Cut& cut)
+Json cutJson(const rules::Cut& cut)
 {
     Json lengths = Json::array();
     for (unsigned row = 0; row < cut.rows(); ++row) {
@@ -139,7 +139,7 @@ Json jsonOf(const rules::Cut& cut)
             {"windows", windows}};
 }
 
-Json jsonOf(const std::vector<NumberFormat>& formats)
+Json formatsJson(const std::vector<NumberFormat>& formats)
 {
     Json list = Json::array();
     for (const NumberFormat& format : formats) {
@@ -153,7 +153,7 @@ Json jsonOf(const std::vector<NumberFormat>& formats)
     return list;
 }
 
-Json jsonOf(const BlockLayout& layout, bool table)
+Json layoutJson(const BlockLayout& layout, bool table)
 {
     Json object = {{"block_size", layout.K},
                    {"f1", layout.f1},
@@ -162,16 +162,16 @@ Json jsonOf(const BlockLayout& layout, bool table)
                    {"trellis_steps", layout.K + rules::tailSteps},
                    {"divisions", Json::array()}};
     for (const rules::Cut& cut : layout.cuts) {
-        object["divisions"].push_back(jsonOf(cut));
+        object["divisions"].push_back(cutJson(cut));
     }
     if (table) {
         object["interleaver"] = layout.interleaver;
     }
-    object["formats"] = jsonOf(numberFormats());
+    object["formats"] = formatsJson(numberFormats());
     return object;
 }
 
-Json jsonOf(const DecoderOptions& core)
+Json coreJson(const DecoderOptions& core)
 {
     return {{"num_pu", core.generics.C_NUM_PU},
             {"algorithm", simulation::algorithmName(static_cast<unsigned>(core.generics.C_ALGORITHM_TYPE))},
@@ -179,22 +179,22 @@ Json jsonOf(const DecoderOptions& core)
             {"iterations", core.iterations}};
 }
 
-std::string generalInformation(const Options& options)
+std::string generalInformation(const InfoOptions& options)
 {
     const DecoderOptions usual;
     if (!options.json) {
         return "Core by default: " + coreText(usual.generics, usual.iterations) + "\n\n" + sizesText() + '\n' +
-               textOf(numberFormats());
+               formatsText(numberFormats());
     }
-    Json object = {{"default_core", jsonOf(usual)}, {"block_sizes", Json::array()}};
+    Json object = {{"default_core", coreJson(usual)}, {"block_sizes", Json::array()}};
     for (const rules::BlockSize& size : rules::blockSizes) {
         object["block_sizes"].push_back({{"block_size", size.K}, {"f1", size.f1}, {"f2", size.f2}});
     }
-    object["formats"] = jsonOf(numberFormats());
+    object["formats"] = formatsJson(numberFormats());
     return object.dump(2) + '\n';
 }
 
-std::string information(const Options& options)
+std::string information(const InfoOptions& options)
 {
     if (!options.K) {
         if (options.table || !options.plot.empty()) {
@@ -210,12 +210,12 @@ std::string information(const Options& options)
         report::writeDrawing(options.plot, pictureOf(layout));
     }
     if (options.json) {
-        return jsonOf(layout, options.table).dump(2) + '\n';
+        return layoutJson(layout, options.table).dump(2) + '\n';
     }
-    return options.table ? tableText(layout) : textOf(layout) + '\n' + textOf(numberFormats());
+    return options.table ? tableText(layout) : layoutText(layout) + '\n' + formatsText(numberFormats());
 }
 
-int inform(const Options& options)
+int inform(const InfoOptions& options)
 {
     print(information(options));
     return success;
@@ -226,7 +226,7 @@ int inform(const Options& options)
 Command addInfo(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("info", "Show how the core handles a block size");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<InfoOptions>();
 
     command->add_option("K", options->K, "Block size in bits; without it, all block sizes")
         ->transform(integerFrom(0, UINT32_MAX))

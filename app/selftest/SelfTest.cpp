@@ -14,15 +14,13 @@ namespace morvik {
 
 namespace {
 
-using namespace selftest;
-
-struct Options {
+struct SelfTestOptions {
     bool json = false;
 };
 
-std::string textOf(const Outcome& outcome, bool isNeeded)
+std::string outcomeText(const selftest::Outcome& outcome, bool isNeeded)
 {
-    const std::size_t all = promise.configurations.size();
+    const std::size_t all = selftest::promise.configurations.size();
     char line[120];
     if (!outcome.available) {
         std::snprintf(line,
@@ -41,21 +39,21 @@ std::string textOf(const Outcome& outcome, bool isNeeded)
                   all,
                   outcome.seconds);
     std::string text = line;
-    for (const Difference& each : outcome.differences) {
+    for (const selftest::Difference& each : outcome.differences) {
         text += "    " + std::to_string(each.numPu) + " units, " +
                 simulation::algorithmName(static_cast<unsigned>(each.algorithm)) + ": digest " +
-                hexadecimal(each.found) + ", expected " + hexadecimal(each.expected) + '\n';
+                selftest::hexadecimal(each.found) + ", expected " + selftest::hexadecimal(each.expected) + '\n';
     }
     return text;
 }
 
-std::string textOf(const Findings& findings)
+std::string findingsText(const selftest::Findings& findings)
 {
     std::string text = std::to_string(findings.blocks) + " blocks of " + std::to_string(findings.bits) +
                        " bits, all 188 sizes: " + (findings.blocksRight ? "right" : "WRONG") + " (digest " +
-                       hexadecimal(findings.blockDigest) + ")\nIn use: " + findings.inUse + '\n';
-    for (const Outcome& outcome : findings.outcomes) {
-        text += textOf(outcome, findings.needs(outcome));
+                       selftest::hexadecimal(findings.blockDigest) + ")\nIn use: " + findings.inUse + '\n';
+    for (const selftest::Outcome& outcome : findings.outcomes) {
+        text += outcomeText(outcome, findings.needs(outcome));
     }
     const std::string decided = std::to_string(findings.bits * findings.configurations());
     text += "Checked: " + decided + " decisions and " + decided + " ratios in " +
@@ -64,14 +62,14 @@ std::string textOf(const Findings& findings)
                                     : "FAILED: this machine does not give the promised bits.\n");
 }
 
-nlohmann::ordered_json jsonOf(const Outcome& outcome)
+nlohmann::ordered_json jsonOf(const selftest::Outcome& outcome)
 {
     nlohmann::ordered_json differences = nlohmann::ordered_json::array();
-    for (const Difference& each : outcome.differences) {
+    for (const selftest::Difference& each : outcome.differences) {
         differences.push_back({{"num_pu", each.numPu},
                                {"algorithm", simulation::algorithmName(static_cast<unsigned>(each.algorithm))},
-                               {"expected", hexadecimal(each.expected)},
-                               {"found", hexadecimal(each.found)}});
+                               {"expected", selftest::hexadecimal(each.expected)},
+                               {"found", selftest::hexadecimal(each.found)}});
     }
     return {{"instruction_set", outcome.instructionSet},
             {"available", outcome.available},
@@ -80,26 +78,26 @@ nlohmann::ordered_json jsonOf(const Outcome& outcome)
             {"seconds", outcome.seconds}};
 }
 
-std::string jsonOf(const Findings& findings)
+std::string jsonOf(const selftest::Findings& findings)
 {
     nlohmann::ordered_json object = {{"version", MORVIK_VERSION},
                                      {"passed", findings.right()},
                                      {"in_use", findings.inUse},
                                      {"blocks", findings.blocks},
                                      {"bits", findings.bits},
-                                     {"block_digest", hexadecimal(findings.blockDigest)},
+                                     {"block_digest", selftest::hexadecimal(findings.blockDigest)},
                                      {"blocks_right", findings.blocksRight},
                                      {"instruction_sets", nlohmann::ordered_json::array()}};
-    for (const Outcome& outcome : findings.outcomes) {
+    for (const selftest::Outcome& outcome : findings.outcomes) {
         object["instruction_sets"].push_back(jsonOf(outcome));
     }
     return object.dump(2) + '\n';
 }
 
-int test(const Options& options)
+int test(const SelfTestOptions& options)
 {
-    const Findings findings = check();
-    print(options.json ? jsonOf(findings) : textOf(findings));
+    const selftest::Findings findings = selftest::check();
+    print(options.json ? jsonOf(findings) : findingsText(findings));
     return findings.right() ? success : differencesFound;
 }
 
@@ -108,7 +106,7 @@ int test(const Options& options)
 Command addSelfTest(CLI::App& app)
 {
     CLI::App* command = app.add_subcommand("selftest", "Check that this machine computes the promised bits");
-    const auto options = std::make_shared<Options>();
+    const auto options = std::make_shared<SelfTestOptions>();
     command->add_flag("--json", options->json, "Print a JSON object instead of text");
     command->footer(R"(Decodes blocks of all sizes in every configuration, with each instruction set that the machine
 has and with the components of the model, and compares digests of the decisions and log-likelihood

@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::size_t mostNames = 1U << 20;  // more than any design has
 
-void add(DumpNames& names, const DumpName& name, const DumpFile& file)
+void addName(DumpNames& names, const DumpName& name, const DumpFile& file)
 {
     if (names.names.size() == mostNames) {
         file.fail("more than " + std::to_string(mostNames) + " names");
@@ -49,7 +49,7 @@ DumpNames namesOfCsv(std::istream& input, const std::string& name)
     const auto value = row.find("value");
     names.hasRows = signal.has_value() && value.has_value();
     for (const std::string_view column : names.hasRows ? std::vector<std::string_view>() : row.fields()) {
-        add(names, {std::string(column), 0}, file);
+        addName(names, {std::string(column), 0}, file);
     }
     Forms forms;
     while (file.nextFilled()) {
@@ -59,7 +59,7 @@ DumpNames namesOfCsv(std::istream& input, const std::string& name)
             if (!names.hasRows || i == *value) {
                 forms.take(fields[i]);
             } else if (i == *signal) {
-                add(names, {std::string(fields[i]), 0}, file);
+                addName(names, {std::string(fields[i]), 0}, file);
             }
         }
     }
@@ -86,7 +86,7 @@ DumpNames namesOfVcd(std::istream& input, const std::string& name)
             const std::string variable = file.nameOfVariable();
             if (kind != "parameter" && inPackage == 0) {
                 const unsigned bits = kind == "real" ? 0 : base::parseNumber<unsigned>(width).value_or(0);
-                add(names, {variable, bits}, file);
+                addName(names, {variable, bits}, file);
             }
         }
     }

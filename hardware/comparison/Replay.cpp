@@ -13,7 +13,7 @@ namespace morvik::comparison {
 namespace {
 
 /// A branch metric or extrinsic value, an aligned word, narrowed to eight bits (rules 5 and 14).
-int narrowed(int value, Mistake mistake)
+int narrowedBy(int value, Mistake mistake)
 {
     switch (mistake.kind) {
     case Mistake::unclipped:
@@ -292,7 +292,7 @@ Replay::Branches Replay::branchMetrics(
         sums[1] = sums[2] = twice + cutTo(-parity, int{rules::inputBits});
     }
     for (std::size_t i = 0; i < sums.size(); ++i) {
-        metrics[i] = rules::wrap16(narrowed(sums[i], mistake));
+        metrics[i] = rules::wrap16(narrowedBy(sums[i], mistake));
     }
     return metrics;
 }
@@ -331,7 +331,7 @@ int Replay::wideExtrinsicValue(int ratio, int twice, Mistake mistake) const
 
 int Replay::extrinsicValue(int ratio, int twice, Mistake mistake) const
 {
-    return narrowed(wideExtrinsicValue(ratio, twice, mistake), mistake) & eighthMask;
+    return narrowedBy(wideExtrinsicValue(ratio, twice, mistake), mistake) & eighthMask;
 }
 
 unsigned Replay::roundingClass(unsigned pass, Stage stage, unsigned trellisStep) const

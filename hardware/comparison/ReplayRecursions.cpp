@@ -88,8 +88,8 @@ void takePending(rules::PendingMetric<Value>& metric, const rules::PendingMetric
     metric.pending = from.pending;
 }
 
-template <class Words>
-Words shifted(Words words, unsigned bits)
+template <class Aligned>
+Aligned shifted(Aligned words, unsigned bits)
 {
     for (auto& word : words) {
         word = rules::wrap16(rules::shiftLeftWrap(word, bits));

@@ -20,7 +20,7 @@ constexpr std::uint32_t simulatedBlocks = 400;
 /// If a smaller fraction of the simulated blocks fails, noise does not explain a failure.
 constexpr double explainedFrom = 0.005;
 
-std::vector<Case> undone(const std::vector<Case>& cases, const Mistakes& mistakes)
+std::vector<Case> allUndone(const std::vector<Case>& cases, const Mistakes& mistakes)
 {
     std::vector<Case> right;
     right.reserve(cases.size());
@@ -74,7 +74,7 @@ public:
             trySmallerSizes(diagnosis);
         }
         tryScale(diagnosis);
-        diagnosis.appearance = appearanceOf(undone(itsCases, diagnosis.best.mistakes));
+        diagnosis.appearance = appearanceOf(allUndone(itsCases, diagnosis.best.mistakes));
         diagnosis.stranger = strangerOf(diagnosis.appearance);
         diagnosis.clipped = valuesThat([](std::int32_t value) { return value < -128 || value > 127; });
         diagnosis.hasNegative = valuesThat([](std::int32_t value) { return value < 0; }) > 0;
@@ -96,7 +96,7 @@ private:
 
     Attempt attempt(const Suspicion& suspicion)
     {
-        const Trial::Result result = itsTrial.decode(undone(itsCases, suspicion.mistakes));
+        const Trial::Result result = itsTrial.decode(allUndone(itsCases, suspicion.mistakes));
         return {suspicion.mistakes, suspicion.signs, true, result.decoded, result.wrongBits};
     }
 
@@ -178,7 +178,7 @@ private:
     /// Tries a scale that is off by a power of two. It is a mistake if it keeps blocks from decoding.
     void tryScale(Diagnosis& diagnosis)
     {
-        const Appearance appearance = appearanceOf(undone(itsCases, diagnosis.best.mistakes));
+        const Appearance appearance = appearanceOf(allUndone(itsCases, diagnosis.best.mistakes));
         const double variance = appearance.power - appearance.amplitude * appearance.amplitude;
         if (appearance.all().certainty() < related || appearance.amplitude <= 0) {
             return;
@@ -234,7 +234,7 @@ private:
     Noise noiseOf(const Diagnosis& diagnosis)
     {
         Noise noise;
-        noise.blockSize = itsTrial.decode(undone(itsCases, diagnosis.best.mistakes)).failedSize;
+        noise.blockSize = itsTrial.decode(allUndone(itsCases, diagnosis.best.mistakes)).failedSize;
         const auto K = static_cast<double>(noise.blockSize);
         const double amplitude = std::max(diagnosis.appearance.amplitude, 1e-3);
         const double variance = std::max(diagnosis.appearance.power - amplitude * amplitude, 1e-3);

@@ -6,6 +6,8 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
+#include "base/Text.h"
+
 namespace morvik::diagnosis {
 
 namespace {
@@ -27,10 +29,11 @@ std::string row(const Attempt& attempt, std::size_t blocks)
     const std::string decoded = std::to_string(attempt.decoded) + " of " + std::to_string(blocks);
     const std::string undone = attempt.mistakes.count() == 0 ? "none: as it is" : listed(attempt.mistakes);
     if (!attempt.decodable) {
-        return rightAligned(decoded, 9) + rightAligned("-", 12) + rightAligned("-", 13) + "  " + undone + '\n';
+        return base::rightAligned(decoded, 9) + base::rightAligned("-", 12) + base::rightAligned("-", 13) + "  " +
+               undone + '\n';
     }
-    return rightAligned(decoded, 9) + rightAligned(std::to_string(attempt.wrongBits), 12) +
-           rightAligned(percent(attempt.signs), 13) + "  " + undone + '\n';
+    return base::rightAligned(decoded, 9) + base::rightAligned(std::to_string(attempt.wrongBits), 12) +
+           base::rightAligned(percent(attempt.signs), 13) + "  " + undone + '\n';
 }
 
 bool isSame(const Mistakes& a, const Mistakes& b)
@@ -164,11 +167,6 @@ std::string fixed(double value, int decimals)
 std::string percent(const Signs& signs)
 {
     return fixed(100 * signs.fraction(), 1) + " %";
-}
-
-std::string rightAligned(const std::string& text, std::size_t width)
-{
-    return std::string(width - std::min(width, text.size()), ' ') + text;
 }
 
 const char* nameOf(Verdict verdict)

@@ -16,9 +16,6 @@ std::string fixed(double value, int decimals);
 /// "18.2 %".
 std::string percent(const Signs& signs);
 
-/// The text behind blanks, `width` characters in all.
-std::string rightAligned(const std::string& text, std::size_t width);
-
 /// The verdict as a word.
 const char* nameOf(Verdict verdict);
 

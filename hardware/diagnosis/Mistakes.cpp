@@ -9,11 +9,11 @@ namespace morvik::diagnosis {
 
 namespace {
 
-using Stream = std::vector<std::int32_t>;
+using SoftStream = std::vector<std::int32_t>;
 
 constexpr const char* columnNames[] = {"rsc1_sys", "rsc1_par", "rsc2_par"};
 
-std::array<Stream*, 3> streamsOf(SoftBlock& block)
+std::array<SoftStream*, 3> streamsOf(SoftBlock& block)
 {
     return {&block.rsc1Sys, &block.rsc1Par, &block.rsc2Par};
 }
@@ -21,7 +21,7 @@ std::array<Stream*, 3> streamsOf(SoftBlock& block)
 /// `size` rows of the streams from `first` on, with zeros for missing ones.
 SoftBlock rowsOf(SoftBlock block, std::size_t first, std::size_t size)
 {
-    for (Stream* stream : streamsOf(block)) {
+    for (SoftStream* stream : streamsOf(block)) {
         stream->erase(stream->begin(), stream->begin() + static_cast<std::ptrdiff_t>(first));
         stream->resize(size);
     }
@@ -239,7 +239,7 @@ void restoreOrder(Case& block, Order order)
         break;
     case Order::rowsReversed:
     case Order::dataReversed:
-        for (Stream* stream : streamsOf(block.received)) {
+        for (SoftStream* stream : streamsOf(block.received)) {
             const std::ptrdiff_t unmoved = order == Order::dataReversed ? tailRows : 0;
             std::reverse(stream->begin(), stream->end() - unmoved);
         }
@@ -272,7 +272,7 @@ Case undone(const Case& block, const Mistakes& mistakes)
         }
     }
     const SoftBlock found = right.received;
-    const std::array<const Stream*, 3> from{&found.rsc1Sys, &found.rsc1Par, &found.rsc2Par};
+    const std::array<const SoftStream*, 3> from{&found.rsc1Sys, &found.rsc1Par, &found.rsc2Par};
     for (std::size_t column = 0; column < 3; ++column) {
         *columns[columnContents[mistakes.columns][column]] = *from[column];
     }

@@ -15,7 +15,7 @@ namespace {
 
 constexpr char end[] = "};";
 
-std::string fileOf(const std::string& folder, const Table& table)
+std::string cFile(const std::string& folder, const Table& table)
 {
     return folder + '/' + table.name + ".c";
 }
@@ -65,7 +65,7 @@ std::string headerText(const Table& table, std::uint64_t rows)
 class CWriter : public TableWriter {
 public:
     CWriter(std::string folder, Table table)
-        : itsFolder(std::move(folder)), itsTable(std::move(table)), itsFile(fileOf(itsFolder, itsTable))
+        : itsFolder(std::move(folder)), itsTable(std::move(table)), itsFile(cFile(itsFolder, itsTable))
     {
         itsFile.write("#include \"" + itsTable.name + ".h\"\n\n" + beginning(itsTable) + '\n');
         itsSuffix = storageOf(itsTable).isSigned ? "" : "U";
@@ -105,8 +105,8 @@ class CReader : public TableReader {
 public:
     CReader(const std::string& folder, Table table)
         : itsTable(std::move(table)),
-          itsFile(base::openFile(fileOf(folder, itsTable))),
-          itsLines(itsFile, fileOf(folder, itsTable), base::LineReader::longLines)
+          itsFile(base::openFile(cFile(folder, itsTable))),
+          itsLines(itsFile, cFile(folder, itsTable), base::LineReader::longLines)
     {
         do {
             if (!itsLines.next()) {

@@ -12,12 +12,12 @@ namespace morvik::tables {
 
 namespace {
 
-std::string fileOf(const std::string& folder, const Table& table)
+std::string csvFile(const std::string& folder, const Table& table)
 {
     return folder + '/' + table.name + ".csv";
 }
 
-std::string header(const Table& table)
+std::string csvHeader(const Table& table)
 {
     std::string line = "block";
     for (const Column& column : table.columns) {
@@ -30,7 +30,7 @@ class CsvWriter : public TableWriter {
 public:
     CsvWriter(base::OutputFile file, const Table& table) : itsFile(std::move(file))
     {
-        itsFile.write(header(table) + '\n');
+        itsFile.write(csvHeader(table) + '\n');
     }
 
     void add(std::uint32_t block, const Row& row) override
@@ -58,11 +58,11 @@ class CsvReader : public TableReader {
 public:
     CsvReader(const std::string& folder, Table table)
         : itsTable(std::move(table)),
-          itsFile(base::openFile(fileOf(folder, itsTable))),
-          itsLines(itsFile, fileOf(folder, itsTable), base::LineReader::longLines)
+          itsFile(base::openFile(csvFile(folder, itsTable))),
+          itsLines(itsFile, csvFile(folder, itsTable), base::LineReader::longLines)
     {
-        if (!itsRow.next() || !itsRow.is(header(itsTable))) {
-            itsLines.fail("expected \"" + header(itsTable) + '"');
+        if (!itsRow.next() || !itsRow.is(csvHeader(itsTable))) {
+            itsLines.fail("expected \"" + csvHeader(itsTable) + '"');
         }
     }
 
@@ -120,7 +120,7 @@ std::unique_ptr<TableWriter> csvWriter(base::OutputFile file, const Table& table
 const Format csvFormat = {"csv",
                           [](const Table& table) { return std::vector<std::string>{table.name + ".csv"}; },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
-                              return csvWriter(base::OutputFile(fileOf(folder, table)), table);
+                              return csvWriter(base::OutputFile(csvFile(folder, table)), table);
                           },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
                               return std::make_unique<CsvReader>(folder, table);

@@ -18,7 +18,7 @@ unsigned digitsOf(const Column& column)
     return (column.bits + bitsOfDigit - 1) / bitsOfDigit;
 }
 
-std::string fileOf(const std::string& folder, const Table& table)
+std::string memhFile(const std::string& folder, const Table& table)
 {
     return folder + '/' + table.name + ".memh";
 }
@@ -36,7 +36,7 @@ std::string layout(const Table& table)
 
 class MemhWriter : public TableWriter {
 public:
-    MemhWriter(const std::string& folder, Table table) : itsTable(std::move(table)), itsFile(fileOf(folder, itsTable))
+    MemhWriter(const std::string& folder, Table table) : itsTable(std::move(table)), itsFile(memhFile(folder, itsTable))
     {
         itsFile.write(layout(itsTable));
     }
@@ -68,8 +68,8 @@ class MemhReader : public TableReader {
 public:
     MemhReader(const std::string& folder, Table table)
         : itsTable(std::move(table)),
-          itsFile(base::openFile(fileOf(folder, itsTable))),
-          itsLines(itsFile, fileOf(folder, itsTable), base::LineReader::longLines)
+          itsFile(base::openFile(memhFile(folder, itsTable))),
+          itsLines(itsFile, memhFile(folder, itsTable), base::LineReader::longLines)
     {
         for (const Column& column : itsTable.columns) {
             itsDigits += digitsOf(column);

@@ -15,13 +15,13 @@ namespace {
 constexpr std::size_t headerSize = 128;  // numbers begin at a multiple of 64 bytes
 constexpr char shapeKey[] = "'shape': (";
 
-std::string fileOf(const std::string& folder, const Table& table)
+std::string npyFile(const std::string& folder, const Table& table)
 {
     return folder + '/' + table.name + ".npy";
 }
 
 /// The header of format version 1.0, padded with blanks to its fixed size.
-std::string header(const Table& table, std::uint64_t rows)
+std::string npyHeader(const Table& table, std::uint64_t rows)
 {
     const Storage storage = storageOf(table);
     const std::string order = storage.bits == 8 ? "|" : "<";
@@ -41,7 +41,7 @@ public:
     NpyWriter(base::OutputFile file, Table table)
         : itsTable(std::move(table)), itsBytes(storageOf(itsTable).bits / 8), itsFile(std::move(file))
     {
-        itsFile.write(header(itsTable, 0));
+        itsFile.write(npyHeader(itsTable, 0));
     }
 
     void add(std::uint32_t, const Row& row) override
@@ -58,7 +58,7 @@ public:
 
     void finish() override
     {
-        itsFile.overwriteStart(header(itsTable, itsRows));
+        itsFile.overwriteStart(npyHeader(itsTable, itsRows));
         itsFile.commit();
     }
 
@@ -75,7 +75,7 @@ public:
     NpyReader(const std::string& folder, Table table)
         : itsTable(std::move(table)),
           itsStorage(storageOf(itsTable)),
-          itsName(fileOf(folder, itsTable)),
+          itsName(npyFile(folder, itsTable)),
           itsFile(base::openFile(itsName)),
           itsPart(itsTable.columns.size() * itsStorage.bits / 8, '\0')
     {
@@ -84,7 +84,7 @@ public:
         const std::size_t key = found.find(shapeKey);
         std::string_view rest = std::string_view(found).substr(key == std::string::npos ? headerSize : key);
         const auto rows = base::take(rest, shapeKey) ? base::takeInteger(rest) : std::nullopt;
-        if (!rows || found != header(itsTable, static_cast<std::uint64_t>(*rows))) {
+        if (!rows || found != npyHeader(itsTable, static_cast<std::uint64_t>(*rows))) {
             throw base::Error(itsName + ": is not the NumPy array that was written");
         }
         itsRows = static_cast<std::uint64_t>(*rows);
@@ -146,7 +146,7 @@ std::unique_ptr<TableWriter> npyWriter(base::OutputFile file, const Table& table
 const Format npyFormat = {"npy",
                           [](const Table& table) { return std::vector<std::string>{table.name + ".npy"}; },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableWriter> {
-                              return npyWriter(base::OutputFile(fileOf(folder, table)), table);
+                              return npyWriter(base::OutputFile(npyFile(folder, table)), table);
                           },
                           [](const std::string& folder, const Table& table) -> std::unique_ptr<TableReader> {
                               return std::make_unique<NpyReader>(folder, table);

@@ -68,7 +68,7 @@ Json tableOf(const KeptTable& kept)
     return {{"name", kept.table.name}, {"rows", kept.rows}, {"columns", columns}};
 }
 
-Json formatOf(const ManifestFormat& format)
+Json entryOf(const ManifestFormat& format)
 {
     Json tables = Json::array();
     for (const KeptTable& kept : format.tables) {
@@ -247,7 +247,7 @@ std::string manifestText(const Manifest& manifest)
     }
     json["formats"] = Json::array();
     for (const ManifestFormat& format : manifest.formats) {
-        json["formats"].push_back(formatOf(format));
+        json["formats"].push_back(entryOf(format));
     }
     constexpr int indentation = 2;
     return json.dump(indentation, ' ', false, Json::error_handler_t::replace) + '\n';

@@ -19,14 +19,9 @@ namespace morvik::vectors {
 
 namespace {
 
-std::string pathOf(const std::string& folder, const std::string& name)
-{
-    return folder + '/' + name;
-}
-
 std::string manifestIn(const std::string& folder)
 {
-    return pathOf(folder, manifestName);
+    return pathIn(folder, manifestName);
 }
 
 /// "decision 3 is 1, expected says 0"
@@ -224,8 +219,8 @@ void expectNoOtherTable(const std::string& folder, const Manifest& manifest)
         }
     }
     for (const std::string& name : others) {
-        if (std::filesystem::exists(base::pathOf(pathOf(folder, name)))) {
-            throw base::Error(pathOf(folder, name) + ": is not a file that " + manifestName +
+        if (std::filesystem::exists(base::pathOf(pathIn(folder, name)))) {
+            throw base::Error(pathIn(folder, name) + ": is not a file that " + manifestName +
                               " names, and cannot be checked");
         }
     }
@@ -238,7 +233,7 @@ std::optional<std::string> checkFormat(const std::string& folder,
                                        Compared& compared)
 {
     for (const ManifestFile& file : format.files) {
-        const std::string path = pathOf(folder, file.name);
+        const std::string path = pathIn(folder, file.name);
         if (base::sha256(path) != file.sha256) {
             throw base::Error(path + ": has changed since it was written: its sha256 differs from the manifest");
         }
@@ -307,7 +302,7 @@ Manifest makeSet(const std::string& folder, Manifest manifest, coverage::Counts*
         ManifestFormat format = {manifest.settings.formats[i], writers[i].tables(), {}};
         for (const KeptTable& kept : format.tables) {
             for (const std::string& name : tables::findFormat(format.name)->files(kept.table)) {
-                format.files.push_back({name, base::sha256(pathOf(set.aside(), name))});
+                format.files.push_back({name, base::sha256(pathIn(set.aside(), name))});
             }
         }
         manifest.formats.push_back(format);

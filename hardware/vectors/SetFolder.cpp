@@ -23,11 +23,6 @@ constexpr char lockName[] = "lock";
 constexpr char earlierName[] = "earlier";     // holds the set being replaced while files move
 constexpr char temporaryName[] = ".morvik-";  // prefix of files that do not have their final names yet
 
-std::string pathOf(const std::string& folder, const std::string& name)
-{
-    return folder + '/' + name;
-}
-
 /// The type of the entry itself: links are not followed.
 fs::file_type kindOf(const std::string& path)
 {
@@ -60,7 +55,7 @@ std::string nameOfLock()
 
 std::string asideIn(const std::string& folder)
 {
-    std::string path = pathOf(folder, asideName);
+    std::string path = pathIn(folder, asideName);
     expectOwnFolder(path);
     return path;
 }
@@ -97,7 +92,7 @@ std::vector<std::string> namesIn(const std::string& folder)
 }
 
 /// The names of a set's files other than the manifest.
-std::vector<std::string> filesOf(const std::string& manifest)
+std::vector<std::string> filesListed(const std::string& manifest)
 {
     std::vector<std::string> names;
     for (const ManifestFormat& format : readManifest(manifest).formats) {
@@ -115,14 +110,19 @@ void expectSetFiles(const std::string& folder, const std::set<std::string>& othe
     known.insert(manifestName);
     for (const std::string& name : namesIn(folder)) {
         const bool isKnown = known.count(name) != 0 || name.rfind(temporaryName, 0) == 0;
-        if (others.count(name) == 0 && (!isKnown || isFolder(pathOf(folder, name)))) {
-            throw base::Error(pathOf(folder, name) + ": is not a file of a set; " + folder +
+        if (others.count(name) == 0 && (!isKnown || isFolder(pathIn(folder, name)))) {
+            throw base::Error(pathIn(folder, name) + ": is not a file of a set; " + folder +
                               " is for unfinished ones alone");
         }
     }
 }
 
 }  // namespace
+
+std::string pathIn(const std::string& folder, const std::string& name)
+{
+    return folder + '/' + name;
+}
 
 SetFolder::Made::Made(std::string folder) : path(std::move(folder)), isOwn(false)
 {
@@ -142,7 +142,7 @@ SetFolder::Made::~Made()
 }
 
 SetFolder::SetFolder(std::string path)
-    : itsFolder(std::move(path)), itsAside(asideIn(itsFolder.path)), itsLock(pathOf(itsAside.path, lockName))
+    : itsFolder(std::move(path)), itsAside(asideIn(itsFolder.path)), itsLock(pathIn(itsAside.path, lockName))
 {
     if (itsLock.isTaken()) {
         throw base::Error(itsFolder.path +
@@ -173,17 +173,17 @@ const std::string& SetFolder::aside() const
 
 std::string SetFolder::placed(const std::string& name) const
 {
-    return pathOf(itsFolder.path, name);
+    return pathIn(itsFolder.path, name);
 }
 
 std::string SetFolder::made(const std::string& name) const
 {
-    return pathOf(itsAside.path, name);
+    return pathIn(itsAside.path, name);
 }
 
 std::string SetFolder::earlier(const std::string& name) const
 {
-    return pathOf(made(earlierName), name);
+    return pathIn(made(earlierName), name);
 }
 
 void SetFolder::place()
@@ -203,7 +203,7 @@ void SetFolder::place()
 /// Continues from wherever it was stopped.
 void SetFolder::moveAll() const
 {
-    const std::vector<std::string> newFiles = filesOf(made(manifestName));
+    const std::vector<std::string> newFiles = filesListed(made(manifestName));
     const std::vector<std::string> oldFiles = earlierFiles();
     if (exists(placed(manifestName))) {
         move(placed(manifestName), earlier(manifestName));
@@ -225,7 +225,7 @@ void SetFolder::moveAll() const
 /// Undoes the moves made so far.
 void SetFolder::moveBack() const
 {
-    for (const std::string& name : filesOf(made(manifestName))) {
+    for (const std::string& name : filesListed(made(manifestName))) {
         if (!exists(made(name))) {
             move(placed(name), made(name));
         }
@@ -278,7 +278,7 @@ void SetFolder::expectOwnAside() const
 void SetFolder::expectSetOrNothing() const
 {
     if (exists(placed(manifestName))) {
-        filesOf(placed(manifestName));
+        filesListed(placed(manifestName));
     } else if (namesIn(itsFolder.path).size() > 1) {
         throw base::Error(itsFolder.path + ": is not empty and holds no " + manifestName + " of an earlier set");
     }
@@ -293,7 +293,7 @@ void SetFolder::expectMovable() const
             throw base::Error(placed(name) + ": is a folder, the earlier set has a file of this name");
         }
     }
-    for (const std::string& name : filesOf(made(manifestName))) {
+    for (const std::string& name : filesListed(made(manifestName))) {
         const bool isThere = exists(placed(name));
         if (!exists(made(name)) && !(isThere && exists(made(earlierName)))) {
             throw base::Error(made(name) + ": is missing, the unfinished set cannot be placed");
@@ -310,7 +310,7 @@ std::vector<std::string> SetFolder::earlierFiles() const
 {
     for (const std::string& manifest : {earlier(manifestName), placed(manifestName)}) {
         if (exists(manifest)) {
-            return filesOf(manifest);
+            return filesListed(manifest);
         }
     }
     return {};
@@ -318,7 +318,7 @@ std::vector<std::string> SetFolder::earlierFiles() const
 
 void expectPlaced(const std::string& folder)
 {
-    if (!exists(pathOf(folder, manifestName)) && exists(pathOf(folder, asideName) + '/' + manifestName)) {
+    if (!exists(pathIn(folder, manifestName)) && exists(pathIn(folder, asideName) + '/' + manifestName)) {
         throw base::Error(folder +
                           ": has a set that is not in place yet; if its command was killed, the next "
                           "'morvik vectors --out' into this folder finishes it");

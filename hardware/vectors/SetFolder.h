@@ -64,6 +64,9 @@ private:
     base::OwnFile itsLock;
 };
 
+/// The path of a file in a folder.
+std::string pathIn(const std::string& folder, const std::string& name);
+
 /// Throws if a killed process has left a set half placed.
 void expectPlaced(const std::string& folder);
 

@@ -10,6 +10,9 @@ namespace morvik::link {
 /// The soft value of a filler bit: the strongest 0.
 constexpr std::int8_t fillerValue = -128;
 
+/// Returns a scale of values or ratios. Throws std::invalid_argument unless it is finite and above 0.
+double checkedScale(double scale);
+
 /// Ratios times scale, rounded with halves away from 0, clipped to -128 ... 127. NaN becomes -128. Returns how many
 /// were clipped.
 std::uint32_t softValues(const float* ratios, std::size_t count, float scale, std::int8_t* values);

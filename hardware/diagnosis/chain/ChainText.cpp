@@ -5,6 +5,7 @@
 #include <cmath>
 #include <nlohmann/json.hpp>
 
+#include "base/Text.h"
 #include "hardware/diagnosis/DiagnosisText.h"
 
 namespace morvik::diagnosis {
@@ -23,8 +24,8 @@ std::string listed(const ChainMistakes& mistakes, const ChainFormat& format)
 std::string row(const ChainAttempt& attempt, const ChainDiagnosis& diagnosis)
 {
     const std::string decoded = std::to_string(attempt.decoded) + " of " + std::to_string(diagnosis.blocks);
-    return rightAligned(decoded, 9) + rightAligned(std::to_string(attempt.wrongBits), 12) +
-           rightAligned(percent(attempt.signs), 13) + "  " + listed(attempt.mistakes, diagnosis.format) + '\n';
+    return base::rightAligned(decoded, 9) + base::rightAligned(std::to_string(attempt.wrongBits), 12) +
+           base::rightAligned(percent(attempt.signs), 13) + "  " + listed(attempt.mistakes, diagnosis.format) + '\n';
 }
 
 /// The attempt without changes, the best or nearest one, and the likeliest others with no more mistakes.
