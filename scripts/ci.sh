@@ -67,12 +67,14 @@ declare -A interfaces=([morvik_v1_0_bitacc_cmodel]=abi [morvik_link]=abi.link [m
 # Compares the binary interfaces with the committed ones, which are stored compressed.
 stage_abi() {
     local bits library
+    build_abi 64
+    build_abi 32
+    export -f compare_abi
     for bits in 64 32; do
-        build_abi $bits
         for library in "${!interfaces[@]}"; do
-            compare_abi $bits "$library" "tests/data/${interfaces[$library]}.$bits.xml.xz"
+            echo $bits "$library" "tests/data/${interfaces[$library]}.$bits.xml.xz"
         done
-    done
+    done | xargs -P "$(nproc)" -n 3 bash -euo pipefail -c 'compare_abi "$@"' compare_abi
 }
 
 # Makes the current interfaces the committed ones, after an intended change.
@@ -92,8 +94,8 @@ build_abi() {
 
 # compare_abi BITS LIBRARY FILE
 compare_abi() {
-    xz --decompress --stdout "$3" >"build/abi-$1.xml"
-    abidiff "build/abi-$1.xml" "build/abi-$1/lib/lib$2.so"
+    xz --decompress --stdout "$3" >"build/abi-$1.$2.xml"
+    abidiff "build/abi-$1.$2.xml" "build/abi-$1/lib/lib$2.so"
 }
 
 # write_abi BITS LIBRARY FILE. What users' headers do not declare may change.
