@@ -129,7 +129,7 @@ stage_memory-short() {
         ChainDiagnosis.Finds{EachMistake,PairsOf,NothingIn,TheSoftBuffer,MistakesBy,Scales})
     local scripts=(example_set example_sweep core_from_document default_core regression report_in_browser same_results same_vectors
         waveforms)
-    memory_without "${long[@]}" "${scripts[@]/%/$}"
+    MORVIK_TEST_BLOCKS=30 memory_without "${long[@]}" "${scripts[@]/%/$}"
 }
 
 # memory_without NAME...: beginnings of names of tests
