@@ -9,8 +9,8 @@ DEFINITION = re.compile(r"^(?:(?:struct|class|enum class|enum) (\w+)|using (?!na
 # Where programs start.
 STARTS = {"main", "sc_main"}
 
-# A name of another namespace.
-BROUGHT = re.compile(r"^using ((?:\w+::)+(\w+));", re.MULTILINE)
+# A name of another namespace, or for another type, which several sources may give alike.
+BROUGHT = re.compile(r"^using (?:(\w+) = )?([^;=]*?(\w+)>?);", re.MULTILINE)
 
 NAMESPACE = re.compile("^using namespace .*", re.MULTILINE)
 
@@ -28,14 +28,14 @@ def names_of(pattern, text):
 
 
 class Names:
-    """The names that a source defines, those of them that no other source sees, where those are from that it brings from
-    another namespace, those that it uses, and the namespaces whose names it uses unqualified."""
+    """The names that a source defines, those of them that no other source sees, what those mean that only stand for another
+    name, those that it uses, and the namespaces whose names it uses unqualified."""
 
     def __init__(self, text):
         self.namespaces = set(NAMESPACE.findall(text))
         self.defined = names_of(DEFINITION, text)
         self.own = names_of(DEFINITION, "".join(OWN.findall(text)))
-        self.brought = {name: path for path, name in BROUGHT.findall(text)}
+        self.brought = {name or last: meaning for name, meaning, last in BROUGHT.findall(text)}
         self.used = names_of(USE, text)
 
 

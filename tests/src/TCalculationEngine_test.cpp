@@ -22,7 +22,7 @@ public:
 };
 
 /// The error line with which a property string is refused.
-std::string refusal(const std::string& properties)
+std::string refusalOfEngine(const std::string& properties)
 {
     const CapturedStreams streams;
     EXPECT_EQ(EnginePointer(TCalculationEngine::create(properties)), nullptr) << properties;
@@ -49,11 +49,11 @@ TEST(TCalculationEngine, IsMadeByItsExactNameAndAnnouncesMODAlone)
 TEST(TCalculationEngine, RefusesOtherNames)
 {
     for (const std::string type : {"mod", "MOD*", "MOD##", "MO", " MOD", "MOD ", "Mod#", ""}) {
-        EXPECT_EQ(refusal(type), "ERROR:TCalculationEngine:Unrecognised type:" + type + "\n");
+        EXPECT_EQ(refusalOfEngine(type), "ERROR:TCalculationEngine:Unrecognised type:" + type + "\n");
     }
-    EXPECT_EQ(refusal("MOD*:16"), "ERROR:TCalculationEngine:Unrecognised type:MOD*\n");
-    EXPECT_EQ(refusal("MOD:0:1"), "ERROR:TCalculationEngineMod:Unexpected properties:0:1\n");
-    EXPECT_EQ(refusal("MOD#:abc"), "ERROR:TCalculationEngineModHash:Illegal number of points\n");
+    EXPECT_EQ(refusalOfEngine("MOD*:16"), "ERROR:TCalculationEngine:Unrecognised type:MOD*\n");
+    EXPECT_EQ(refusalOfEngine("MOD:0:1"), "ERROR:TCalculationEngineMod:Unexpected properties:0:1\n");
+    EXPECT_EQ(refusalOfEngine("MOD#:abc"), "ERROR:TCalculationEngineModHash:Illegal number of points\n");
 }
 
 TEST(TCalculationEngine, StartsWithoutFormatsAndWithoutSSE2)

@@ -92,7 +92,7 @@ std::string textOf(const std::vector<TDecoder3GPU::ABSegment>& segments)
 }
 
 /// The error line with which a property string is refused.
-std::string refusal(const std::string& properties)
+std::string refusalOfUnits(const std::string& properties)
 {
     const CapturedStreams streams;
     EXPECT_EQ(std::unique_ptr<TDecoder>(TDecoder3GPU::create(false, properties)), nullptr) << properties;
@@ -127,11 +127,12 @@ TEST(TDecoder3GPU, ReadsUnitsAndThreadsFromItsProperties)
 TEST(TDecoder3GPU, RefusesNoUnitsNoThreadsAndWhatIsNoNumber)
 {
     for (const char* properties : {"0", "x", ",4", "0,4"}) {
-        EXPECT_EQ(refusal(properties), "ERROR:TDecoder3GPU:Illegal number of processing units:0\n") << properties;
+        EXPECT_EQ(refusalOfUnits(properties), "ERROR:TDecoder3GPU:Illegal number of processing units:0\n")
+            << properties;
     }
-    EXPECT_EQ(refusal("4294967296"), "ERROR:TDecoder3GPU:Illegal number of processing units:4294967295\n");
+    EXPECT_EQ(refusalOfUnits("4294967296"), "ERROR:TDecoder3GPU:Illegal number of processing units:4294967295\n");
     for (const char* properties : {"4,0", "4,x", "4,,"}) {
-        EXPECT_EQ(refusal(properties), "ERROR:TDecoder3GPU:Illegal number of threads per processing unit:0\n")
+        EXPECT_EQ(refusalOfUnits(properties), "ERROR:TDecoder3GPU:Illegal number of threads per processing unit:0\n")
             << properties;
     }
 }

@@ -45,7 +45,7 @@ public:
 };
 
 /// The error line with which a property string is refused.
-std::string refusal(const std::string& properties)
+std::string refusalOfDecoder(const std::string& properties)
 {
     const CapturedStreams streams;
     EXPECT_EQ(DecoderPointer(TDecoder::create(properties)), nullptr) << properties;
@@ -73,10 +73,10 @@ TEST(TDecoder, MakesProcessingUnitDecodersAlone)
 TEST(TDecoder, RefusesOtherNames)
 {
     for (const std::string type : {"3GPP", "3GPP2", "3GPP2PU", "3gpppu", "3GPPPU ", ""}) {
-        EXPECT_EQ(refusal(type), "ERROR:TDecoder:Unrecognised type:" + type + "\n");
-        EXPECT_EQ(refusal(type + ":4"), "ERROR:TDecoder:Unrecognised type:" + type + "\n");
+        EXPECT_EQ(refusalOfDecoder(type), "ERROR:TDecoder:Unrecognised type:" + type + "\n");
+        EXPECT_EQ(refusalOfDecoder(type + ":4"), "ERROR:TDecoder:Unrecognised type:" + type + "\n");
     }
-    EXPECT_EQ(refusal("3GPPPU:0"), "ERROR:TDecoder3GPU:Illegal number of processing units:0\n");
+    EXPECT_EQ(refusalOfDecoder("3GPPPU:0"), "ERROR:TDecoder3GPU:Illegal number of processing units:0\n");
 }
 
 TEST(TDecoder, StartsEmptyAndUnscaled)

@@ -33,7 +33,7 @@ public:
 };
 
 /// The error line with which a property string is refused.
-std::string refusal(const std::string& properties)
+std::string refusalOfInterleaver(const std::string& properties)
 {
     const CapturedStreams streams;
     EXPECT_EQ(InterleaverPointer(TInterleaver::create(properties)), nullptr) << properties;
@@ -70,10 +70,10 @@ TEST(TInterleaver, IsMadeByItsExactName)
 TEST(TInterleaver, RefusesOtherNames)
 {
     for (const std::string type : {"QPP", "3gpplte", " 3GPPLTE", "3GPPLTE ", "3GPPLT", ""}) {
-        EXPECT_EQ(refusal(type), "ERROR:TInterleaver:Unrecognised type:" + type + "\n");
+        EXPECT_EQ(refusalOfInterleaver(type), "ERROR:TInterleaver:Unrecognised type:" + type + "\n");
     }
-    EXPECT_EQ(refusal(":3GPPLTE"), "ERROR:TInterleaver:Unrecognised type:\n");
-    EXPECT_EQ(refusal("3GPPLTE:x"), "ERROR:TInterleaver3GPPLTE:Unexpected properties:x\n");
+    EXPECT_EQ(refusalOfInterleaver(":3GPPLTE"), "ERROR:TInterleaver:Unrecognised type:\n");
+    EXPECT_EQ(refusalOfInterleaver("3GPPLTE:x"), "ERROR:TInterleaver3GPPLTE:Unexpected properties:x\n");
 }
 
 TEST(TInterleaver, KnowsEverySizeBut0)

@@ -21,7 +21,7 @@ std::string printed(const TNumberFormat& format)
 }
 
 /// The error line with which a property string is refused.
-std::string refusal(const std::string& properties)
+std::string refusalOfFormat(const std::string& properties)
 {
     const CapturedStreams streams;
     EXPECT_EQ(FormatPointer(TNumberFormat::create(properties)), nullptr) << properties;
@@ -85,21 +85,22 @@ TEST(TNumberFormat, RefusesOtherTextsAndRepeatsThem)
                                          "Fixx_8_3",
                                          " Fix_8_3",
                                          ""}) {
-        EXPECT_EQ(refusal(properties), "ERROR:TNumberFormat:Unexpected property string:" + properties + "\n");
+        EXPECT_EQ(refusalOfFormat(properties), "ERROR:TNumberFormat:Unexpected property string:" + properties + "\n");
     }
 }
 
 TEST(TNumberFormat, RefusesWidthsOutside1To16BeforeItLooksAtTheBinaryPoint)
 {
     for (const char* properties : {"Fix_0_0", "Fix_17_3", "Fix_17_0", "Fix_-1_3"}) {
-        EXPECT_EQ(refusal(properties), "ERROR:TNumberFormat:nbits must be in range [1:16]\n") << properties;
+        EXPECT_EQ(refusalOfFormat(properties), "ERROR:TNumberFormat:nbits must be in range [1:16]\n") << properties;
     }
 }
 
 TEST(TNumberFormat, RefusesABinaryPointOf0OrNotBelowTheWidth)
 {
     for (const char* properties : {"Fix_8_0", "Fix_8_8", "Fix_16_16", "Fix_16_17", "Fix_1_1", "Fix_1_0"}) {
-        EXPECT_EQ(refusal(properties), "ERROR:TNumberFormat:binpt must be in range [1:16] and <nbits\n") << properties;
+        EXPECT_EQ(refusalOfFormat(properties), "ERROR:TNumberFormat:binpt must be in range [1:16] and <nbits\n")
+            << properties;
     }
 }
 

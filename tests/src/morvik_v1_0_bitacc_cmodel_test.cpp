@@ -24,7 +24,7 @@ using Change = std::function<void(Generics&)>;
 
 constexpr std::uint32_t untouched = 0xDEADBEEF;
 
-std::string refusal(const Change& change)
+std::string refusalOf(const Change& change)
 {
     Generics generics = veltra_ip_morvik_v1_0_get_default_generics();
     change(generics);
@@ -153,7 +153,7 @@ TEST(CreateState, RefusesEachBadGenericWithItsOwnLine)
         {[](Generics& g) { g.C_INPUT_FRAC_WIDTH = 0; }, "C_INPUT_FRAC_WIDTH must be 3"},
     };
     for (const auto& [change, reason] : cases) {
-        EXPECT_EQ(refusal(change), "ERROR:decoder:" + reason + "\n");
+        EXPECT_EQ(refusalOf(change), "ERROR:decoder:" + reason + "\n");
     }
 }
 
@@ -174,7 +174,7 @@ TEST(CreateState, ReportsTheFirstOfSeveralBadGenerics)
                 inOrder[i](g);
             }
         };
-        EXPECT_EQ(refusal(allFrom), refusal(inOrder[first]));
+        EXPECT_EQ(refusalOf(allFrom), refusalOf(inOrder[first]));
     }
 }
 
