@@ -132,17 +132,34 @@ stage_memory-short() {
     MORVIK_TEST_BLOCKS=30 memory_without "${long[@]}" "${scripts[@]/%/$}"
 }
 
-# memory_without NAME...: beginnings of names of tests
+# memory_without NAME...: beginnings of names of tests; a script's name ends with $
 memory_without() {
     local skipped
     skipped=$(IFS='|'; echo "${*/#/^}")
     scripts/build sanitize
-    scripts/run-tests sanitize -E "$skipped"
+    # A process for many tests: to start one with sanitizers takes longer than most tests do.
+    export -f sanitized
+    local program shard
+    for program in build/sanitize/tests/*_test; do
+        for ((shard = 0; shard < $(nproc); ++shard)); do
+            echo "$program" $shard
+        done
+    done | xargs -P "$(nproc)" -n 2 bash -euo pipefail -c 'sanitized "$@"' sanitized "-$(IFS=:; echo "${*/%/*}")"
+    scripts/run-tests sanitize -E "$skipped|[.]"
     scripts/build x86_64 app_test library_test src_test
     MORVIK_TEST_COMMAND=$PWD/build/sanitize/bin/morvik \
         scripts/run-tests x86_64 -L '^command$' -R '[.]' -E "$skipped|^BlockLayout|^Programs|^SelfCheck|^SelfTest|^MpiRuns"
     uninitialised library_test 'ExactBlocks.*:*RandomBlocks.*'
     uninitialised src_test 'Generics.*:*State.*:DumpConfig.*:Simulate.*:TDecoder3G.*:*TDecoder3GPU.*'
+}
+
+# sanitized FILTER PROGRAM SHARD
+sanitized() {
+    local log
+    log=$2.$3.log
+    GTEST_TOTAL_SHARDS=$(nproc) GTEST_SHARD_INDEX=$3 "$2" --gtest_brief=1 --gtest_filter="$1" >"$log" 2>&1 ||
+        { cat "$log"; return 1; }
+    echo "${2##*/} $3: $(tail -n 1 "$log")"
 }
 
 # uninitialised PROGRAM FILTER
@@ -298,7 +315,6 @@ stage_starts() {
     build/coverage/tests/src_test --gtest_brief=1 --gtest_filter='*TNumberFormat.*'
     count_lines src/TNumberFormat.cpp
     scripts/mutate --only src/TNumberFormat.cpp --every 100 --anew
-    scripts/packages x86_64
     scripts/validate --tables
     scripts/renew-results
     git diff --exit-code docs/validation.md docs/scale.md tests/data/ber tests/data/same_files.txt
