@@ -122,12 +122,14 @@ TEST(ToSIString, FormatsValuesThatAreNoNumbers)
 
 TEST(ToSIString, PrintsEveryDigitOfTheLongestFraction)
 {
-    // 2^-16445, the smallest long double, ends in a 5 at its 16445th digit.
-    const long double smallest = std::numeric_limits<long double>::denorm_min();
-    const std::string exact = toSIString(smallest, 16445);
-    EXPECT_EQ(exact.size(), 2U + 16445U + 1U);
+    // The smallest long double, 2^-16445 on x86, ends in a 5 at its 16445th digit.
+    using Limits = std::numeric_limits<long double>;
+    const long double smallest = Limits::denorm_min();
+    constexpr unsigned digits = static_cast<unsigned>(Limits::digits - Limits::min_exponent);
+    const std::string exact = toSIString(smallest, digits);
+    EXPECT_EQ(exact.size(), 2U + digits + 1U);
     EXPECT_EQ(exact.substr(exact.size() - 2), "5 ");
-    EXPECT_EQ(toSIString(smallest, 16447), exact.substr(0, exact.size() - 1) + "00 ");
+    EXPECT_EQ(toSIString(smallest, digits + 2), exact.substr(0, exact.size() - 1) + "00 ");
 }
 
 TEST(ToSIString, SurvivesAPrecisionBeyondTheStack)
