@@ -147,12 +147,8 @@ TEST_F(Systems, GiveProgramsEveryArgumentAsItIs)
 TEST_F(Systems, SayThatAProgramIsMissing)
 {
     try {
-        const morvik::base::Outcome outcome = morvik::base::runProgram({"morvik-no-such-program"}, "");
-#ifdef MORVIK_TEST_EMULATED
-        EXPECT_FALSE(outcome.succeeded);  // QEMU forks where it should wait for the program's start, and so hides why
-#else
-        FAIL() << "it was found, with the status of a " << (outcome.succeeded ? "success" : "failure");
-#endif
+        morvik::base::runProgram({"morvik-no-such-program"}, "");
+        FAIL() << "it was found";
     } catch (const std::system_error& error) {
         EXPECT_EQ(error.code(), std::errc::no_such_file_or_directory);
     }
