@@ -2,21 +2,10 @@
 #include "SoftValues.h"
 
 #include <algorithm>
-#include <cmath>
-#include <stdexcept>
-#include <string>
 
 #include "link/kernels/RowKernels.h"
 
 namespace morvik::link {
-
-double checkedScale(double scale)
-{
-    if (!(scale > 0) || !std::isfinite(scale)) {
-        throw std::invalid_argument("a scale of " + std::to_string(scale));
-    }
-    return scale;
-}
 
 std::uint32_t softValues(const float* ratios, std::size_t count, float scale, std::int8_t* values)
 {

@@ -2,8 +2,11 @@
 #ifndef MORVIK_LINK_CODING_SOFTVALUES_H
 #define MORVIK_LINK_CODING_SOFTVALUES_H
 
+#include <cmath>
 #include <cstddef>
 #include <cstdint>
+#include <stdexcept>
+#include <string>
 
 namespace morvik::link {
 
@@ -11,7 +14,13 @@ namespace morvik::link {
 constexpr std::int8_t fillerValue = -128;
 
 /// Returns a scale of values or ratios. Throws std::invalid_argument unless it is finite and above 0.
-double checkedScale(double scale);
+inline double checkedScale(double scale)
+{
+    if (!(scale > 0) || !std::isfinite(scale)) {
+        throw std::invalid_argument("a scale of " + std::to_string(scale));
+    }
+    return scale;
+}
 
 /// Ratios times scale, rounded with halves away from 0, clipped to -128 ... 127. NaN becomes -128. Returns how many
 /// were clipped.

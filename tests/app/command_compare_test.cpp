@@ -76,14 +76,22 @@ TEST_F(Compare, ReadsPackedDumps)
     ASSERT_EQ(shell("mkdir bin && printf '#!/bin/sh\\nexit 3\\n' >bin/fst2vcd && chmod +x bin/fst2vcd"), 0);
     ASSERT_EQ(setenv("PATH", (morvik.directory() + "/bin:" + path).c_str(), 1), 0);
     expectRefused(compareWith("trace.fst"), "trace.fst: cannot be unpacked by fst2vcd: it failed without a message");
+    ASSERT_EQ(setenv("PATH", path.c_str(), 1), 0);
+}
+
+TEST_F(Compare, SaysWhenToolsOfWaveformsAreMissing)
+{
+    writeBlock(40);
+    morvik.run({"trace", "block.csv", "--format", "fst", "--output", "trace.fst"});
+    const std::string path = std::getenv("PATH");
     ASSERT_EQ(setenv("PATH", "/nowhere", 1), 0);
-    const CommandResult withoutTool = compareWith("trace.fst");
+    const CommandResult notRead = morvik.run({"compare", "--block", "block.csv", "--dump", "trace.fst"});
     const CommandResult notWritten = morvik.run({"trace", "block.csv", "--format", "fst", "--output", "other.fst"});
     ASSERT_EQ(setenv("PATH", path.c_str(), 1), 0);
     EXPECT_EQ(notWritten.err,
               "morvik trace: vcd2fst, which writes FST waveforms (Debian package gtkwave), cannot be started: No such "
               "file or directory\n");
-    expectRefused(withoutTool,
+    expectRefused(notRead,
                   "trace.fst: is an FST waveform, which fst2vcd reads (Debian package gtkwave), and fst2vcd cannot be "
                   "started: No such file or directory");
 }
