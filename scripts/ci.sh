@@ -174,9 +174,8 @@ stage_threads() {
     build/threads/tests/frame_simulator_test --gtest_brief=1 --gtest_filter='ThreadWorkers*'
 }
 
-# Every fuzzer on its corpus and 4000 inputs derived from it (1500 if they are decoded), always the same ones. With
-# HOSTILE_SECONDS each runs for that time on varying inputs; HOSTILE_CORPUS names a folder that keeps the findings of long runs for
-# the next.
+# Every fuzzer on its corpus and a few thousand inputs derived from it, always the same ones. With HOSTILE_SECONDS each
+# runs for that time on varying inputs; HOSTILE_CORPUS names a folder that keeps the findings of long runs for the next.
 stage_hostile() {
     local fuzzers
     mapfile -t fuzzers < <(sed -n '/^foreach(fuzzer/,/)$/s/^ *\([a-z_]*_fuzz\).*/\1/p' tests/fuzz/CMakeLists.txt)
@@ -195,7 +194,6 @@ stage_hostile() {
 # fuzz CORPUS FUZZER
 fuzz() {
     local limit=(-runs=4000 -seed=36212)
-    [ "$2" != simulate_fuzz ] || limit=(-runs=1500 -seed=36212)
     local log=build/sanitize/$2.log
     [ -z "${HOSTILE_SECONDS:-}" ] || limit=(-max_total_time="$HOSTILE_SECONDS")
     [ ! -e "tests/fuzz/dictionaries/$2.dict" ] || limit+=(-dict="tests/fuzz/dictionaries/$2.dict")
@@ -321,6 +319,7 @@ stage_starts() {
     build/coverage/tests/src_test --gtest_brief=1 --gtest_filter='*TNumberFormat.*'
     count_lines src/TNumberFormat.cpp
     scripts/mutate --only src/TNumberFormat.cpp --every 100 --anew
+    scripts/packages x86_64
     scripts/validate --tables
     scripts/renew-results
     git diff --exit-code docs/validation.md docs/scale.md tests/data/ber tests/data/same_files.txt

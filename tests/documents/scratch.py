@@ -60,8 +60,6 @@ class Scratch:
 def copy_of_tree(folder, build):
     """A scratch folder with a copy of the tree, whose scripts take what is built in the folder BUILD."""
     build = pathlib.Path(build).resolve()
-    kept = build / "tests/documents/objects"
-    kept.mkdir(parents=True, exist_ok=True)
     scratch = Scratch(folder, {
         "PATH": f"{build}/bin:{os.environ['PATH']}",
         "PYTHONPATH": f"{build}/python",
@@ -69,8 +67,8 @@ def copy_of_tree(folder, build):
         "MPLBACKEND": "Agg",
         # What Verilator makes is compiled without optimisation, and its own sources once.
         "MAKEFLAGS": "OPT_FAST=-O0 OPT_SLOW=-O0 OPT_GLOBAL=-O0",
-        "OBJCACHE": f"{TREE}/tests/documents/compile_once",
-        "KEPT_OBJECTS": str(kept),
+        "OBJCACHE": f"{TREE}/bindings/systemverilog/tests/compile_once",
+        "KEPT_OBJECTS": str(build / "tests/documents/objects"),
         "OMPI_ALLOW_RUN_AS_ROOT": "1",
         "OMPI_ALLOW_RUN_AS_ROOT_CONFIRM": "1",
     })
