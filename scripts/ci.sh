@@ -121,7 +121,7 @@ stage_memory() {
 stage_memory-short() {
     local long=(BerRuns Faults/FaultyCore Stages/Mistakes Coverage.IsWholeInASet SelfCheck.FindsTheLibraryRight
         SelfCheck.Notices{TheLast,Another,Other} VcdDump.RefusesTimesAndChangesWithoutAnEnd
-        Vectors.{ChecksCasesOfUnits,WritesWhatDecodeReads} Sizes/ModelValues.FollowFromEachOther/{2560,6144}
+        Vectors.{ChecksCasesOfUnits,WritesWhatDecodeReads} Sizes/ModelValues.FollowFromEachOther/{6,7}
         Trace.NeedsNoMore DefaultScale.HalfAnd Situations.AreCountedAs FrameSource.DrawsWhat VectorSet.IsAsTheModelDecodesWithAll
         BerLink.GoesOnUntil Compare.{AgreesWithTheTrace,TellsThatADump,TellsWhichCore} CodeBlocksTest.AgreesWithTheClause)
     long+=(Diagnosis.{BlamesNoiseAlone,TakesNoChance,Finds{EachMistake,PairsOf,NothingIn,TheTails,AMissingOr,AScaleBeside}}
