@@ -273,6 +273,12 @@ MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> index)
     return {(Raw<32>::Signed)_mm512_permutexvar_epi16((__m512i)index.v, (__m512i)a.v)};
 }
 
+/// Takes the words of `a` for indices whose low six bits are below 32, else those of `b`.
+MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> b, Eighths<32> index)
+{
+    return {(Raw<32>::Signed)_mm512_permutex2var_epi16((__m512i)a.v, (__m512i)index.v, (__m512i)b.v)};
+}
+
 struct Avx512 : Avx2 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16, 32>;
     static constexpr bool holdsTwoRecursions = sizeof(void*) == 8;  // 32-bit code has eight registers
@@ -304,32 +310,40 @@ struct Avx512 : Avx2 {
         }
     };
 
-    /// The entries for both signs fit the words of a vector of sixteen lanes or more, whose permutation takes the low
-    /// bits of its index.
+    /// Entries for both signs: of each step in the words of one vector of sixteen lanes, or of each difference in those
+    /// of two vectors of 32, which saves the shift to steps. A permutation takes the low bits of its index.
     template <unsigned count>
     class Corrections {
     public:
         explicit MORVIK_INLINE Corrections(const std::uint8_t* entries)
         {
-            for (unsigned i = 0; i < words; ++i) {
-                itsEntries.v[i] = entries[correctionEntry(static_cast<int>((i + 8) % 16) - correctionEntries)];
+            for (int i = 0; i < indices; ++i) {
+                const int index = i < indices / 2 ? i : i - indices;
+                const int steps = index >> (correctionStepBits - indexShift);
+                itsEntries[i / int{words}].v[i % int{words}] = entries[correctionEntry(steps)];
             }
         }
 
         MORVIK_INLINE Eighths<count> operator()(Eighths<count> difference) const
         {
-            constexpr int reach = correctionEntries * correctionStep;
-            const Eighths<count> index = clip(difference, -reach, reach - 1) >> correctionStepBits;
-            if constexpr (count == words) {
-                return permuteWords(itsEntries, index);
+            const Eighths<count> index = clip(difference, -reach, reach - 1) >> indexShift;
+            if constexpr (vectors == 2) {
+                return permuteWords(itsEntries[0], itsEntries[1], index);
+            } else if constexpr (count == words) {
+                return permuteWords(itsEntries[0], index);
             } else {
-                return part<count, 0>(permuteWords(itsEntries, join(index, index)));
+                return part<count, 0>(permuteWords(itsEntries[0], join(index, index)));
             }
         }
 
     private:
+        static constexpr int reach = correctionEntries * correctionStep;
         static constexpr unsigned words = count < 16 ? 16 : count;
-        Eighths<words> itsEntries;
+        static constexpr unsigned vectors = words == 32 ? 2 : 1;
+        static constexpr int indices = vectors * words;
+        static constexpr int indexShift = vectors == 2 ? 0 : correctionStepBits;
+        static_assert(indices << indexShift == 2 * reach);
+        Eighths<words> itsEntries[vectors];
     };
 
     using Avx2::scaledHalf;

@@ -83,23 +83,37 @@ struct Corrected {
                                           const BranchMetrics<count>& g) const
     {
         const Decision rule = decision();
-        std::array<typename Decision::Metric, 4> one{};
-        std::array<typename Decision::Metric, 4> zero{};
+        Best one;
+        Best zero;
         b = rules::backwardStep(rule, b, g, [&](auto pair, const auto& c) MORVIK_INLINE_LAMBDA {
             const Eighths<count> even = a[2 * pair];
             const Eighths<count> odd = a[2 * pair + 1];
-            one[pair] = rule.decide(odd + c.one[1].value, even + c.one[0].value);
-            zero[pair] = rule.decide(odd + c.zero[1].value, even + c.zero[0].value);
+            one.template take<pair>(rule, rule.decide(odd + c.one[1].value, even + c.one[0].value));
+            zero.template take<pair>(rule, rule.decide(odd + c.zero[1].value, even + c.zero[0].value));
         });
-        return best(rule, one) - best(rule, zero);
+        return rule.settled(one.half[0]) - rule.settled(zero.half[0]);
     }
 
 private:
-    static MORVIK_INLINE Eighths<count> best(const Decision& rule,
-                                             const std::array<typename Decision::Metric, 4>& pairs)
-    {
-        return rule.settled(rule.decide(rule.decide(pairs[0], pairs[1]), rule.decide(pairs[2], pairs[3])));
-    }
+    using Metric = typename Decision::Metric;
+
+    /// The decisions between pairs, each as soon as both are there, so that few values are alive.
+    struct Best {
+        Metric half[2] = {};
+
+        template <unsigned pair>
+        MORVIK_INLINE void take(const Decision& rule, const Metric& best)
+        {
+            if constexpr (pair % 2 == 0) {
+                half[pair / 2] = best;
+            } else {
+                half[pair / 2] = rule.decide(half[pair / 2], best);
+            }
+            if constexpr (pair == 3) {
+                half[0] = rule.decide(half[0], half[1]);
+            }
+        }
+    };
 };
 
 }  // namespace morvik::lanes::MORVIK_LANES
