@@ -83,7 +83,7 @@ public:
             saveForward(v, columnAt(itsConstituent.alphaStart + v * count));
         }
         Windows windows = windowsFrom(0, 0, 0, slotWords);
-        runForward(windows);
+        runForward(windows, [&](Column& a) MORVIK_INLINE_LAMBDA { forward(windows, 0, a); });
         while (windows.length != 0) {
             const Windows next = following(windows);
             runWindows<ratios>(windows, next);
@@ -144,12 +144,16 @@ private:
         return windowsFrom(windows.r[abreast - 1] + 1, 0, slot, -windows.direction);
     }
 
-    MORVIK_INLINE void runForward(const Windows& windows) const
+    /// Runs the forward recursion of windows one after another; runFirst(a) does so for the first one.
+    template <class RunFirst>
+    MORVIK_INLINE void runForward(const Windows& windows, RunFirst runFirst) const
     {
         Column a = restoreForward(windows.v);
-        Column start{};
-        for (unsigned j = 0; j < abreast; ++j) {
-            if (j > 0 && windows.r[j] == windows.r[j - 1]) {
+        Column start = a;
+        runFirst(a);
+        a = broughtBack<Decision>(a);
+        for (unsigned j = 1; j < abreast; ++j) {
+            if (windows.r[j] == windows.r[j - 1]) {
                 a = start;
             }
             start = a;
@@ -159,7 +163,7 @@ private:
         saveForward(windows.v, a);
     }
 
-    /// Runs the backward recursion of windows, together with the forward recursion of the next ones if registers
+    /// Runs the backward recursion of windows, together with the forward recursion of the next one if registers
     /// suffice for both: two independent dependency chains keep the execution units busy.
     template <Ratios ratios>
     MORVIK_INLINE void runWindows(const Windows& windows, const Windows& next) const
@@ -167,21 +171,19 @@ private:
         WideColumn b = startColumn(windows);
         if constexpr (overlapped) {
             if (next.length != 0) {
-                Column a = restoreForward(next.v);
-                both<ratios>(windows, b, next, a);
-                saveForward(next.v, broughtBack<Decision>(a));
+                runForward(next, [&](Column& a) MORVIK_INLINE_LAMBDA { both<ratios>(windows, b, next, a); });
             }
             backward<ratios>(windows, windows.length - next.length, b);
         } else {
             backward<ratios>(windows, windows.length, b);
             if (next.length != 0) {
-                runForward(next);
+                runForward(next, [&](Column& a) MORVIK_INLINE_LAMBDA { forward(next, 0, a); });
             }
         }
         storeReached(windows, b);
     }
 
-    static constexpr bool overlapped = Machine::holdsTwoRecursions && Rule::fewRegisters && abreast == 1;
+    static constexpr bool overlapped = Machine::holdsTwoRecursions && Rule::fewRegisters;
 
     MORVIK_INLINE void forward(const Windows& windows, unsigned j, Column& a) const
     {
