@@ -83,7 +83,7 @@ public:
             saveForward(v, columnAt(itsConstituent.alphaStart + v * count));
         }
         Windows windows = windowsFrom(0, 0, 0, slotWords);
-        runForward(windows, [&](Column& a) MORVIK_INLINE_LAMBDA { forward(windows, 0, a); });
+        runForward(windows);
         while (windows.length != 0) {
             const Windows next = following(windows);
             runWindows<ratios>(windows, next);
@@ -163,6 +163,11 @@ private:
         saveForward(windows.v, a);
     }
 
+    MORVIK_INLINE void runForward(const Windows& windows) const
+    {
+        runForward(windows, [&](Column& a) MORVIK_INLINE_LAMBDA { forward(windows, 0, a); });
+    }
+
     /// Runs the backward recursion of windows, together with the forward recursion of the next one if registers
     /// suffice for both: two independent dependency chains keep the execution units busy.
     template <Ratios ratios>
@@ -177,7 +182,7 @@ private:
         } else {
             backward<ratios>(windows, windows.length, b);
             if (next.length != 0) {
-                runForward(next, [&](Column& a) MORVIK_INLINE_LAMBDA { forward(next, 0, a); });
+                runForward(next);
             }
         }
         storeReached(windows, b);
