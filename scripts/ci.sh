@@ -61,52 +61,54 @@ stage_compilers() {
     done
 }
 
-# The libraries, and the files of tests/data/ with their binary interfaces.
+# The libraries, and the files of tests/data/ with their binary interfaces, by the bits of a word.
 declare -A interfaces=([morvik_v1_0_bitacc_cmodel]=abi [morvik_link]=abi.link [morvik_checker]=abi.checker)
+declare -A bits=([x86_64]=64 [i386]=32)
 
 # Compares the binary interfaces with the committed ones, which are stored compressed.
 stage_abi() {
-    local bits library
-    build_abi 64
-    build_abi 32
+    local preset library
+    build_abi x86_64
+    build_abi i386
     export -f compare_abi
-    for bits in 64 32; do
+    for preset in x86_64 i386; do
         for library in "${!interfaces[@]}"; do
-            echo $bits "$library" "tests/data/${interfaces[$library]}.$bits.xml.xz"
+            echo $preset "$library" "tests/data/${interfaces[$library]}.${bits[$preset]}.xml.xz"
         done
     done | xargs -P "$(nproc)" -n 3 bash -euo pipefail -c 'compare_abi "$@"' compare_abi
 }
 
 # Makes the current interfaces the committed ones, after an intended change.
 stage_abi-renew() {
-    local bits library
-    for bits in 64 32; do
-        build_abi $bits
+    local preset library
+    for preset in x86_64 i386; do
+        build_abi $preset
         for library in "${!interfaces[@]}"; do
-            write_abi $bits "$library" "tests/data/${interfaces[$library]}.$bits.xml.xz"
+            write_abi $preset "$library" "tests/data/${interfaces[$library]}.${bits[$preset]}.xml.xz"
         done
     done
 }
 
 build_abi() {
-    scripts/build "abi-$1" morvik_v1_0_bitacc_cmodel morvik_link_c morvik_checker_c
+    scripts/build "$1" morvik_v1_0_bitacc_cmodel morvik_link_c morvik_checker_c
 }
 
-# compare_abi BITS LIBRARY FILE
+# compare_abi PRESET LIBRARY FILE
 compare_abi() {
-    xz --decompress --stdout "$3" >"build/abi-$1.$2.xml"
-    abidiff "build/abi-$1.$2.xml" "build/abi-$1/lib/lib$2.so"
+    local kept=build/$1/$2.xml
+    xz --decompress --stdout "$3" >"$kept"
+    abidiff "$kept" "build/$1/lib/lib$2.so"
 }
 
-# write_abi BITS LIBRARY FILE. What users' headers do not declare may change.
+# write_abi PRESET LIBRARY FILE. What users' headers do not declare may change.
 write_abi() {
-    local headers=build/abi-headers
+    local headers=build/$1/abi-headers
     rm -rf "$headers"
     mkdir "$headers"
     cp include/*.h rules/*.h src/DecoderState.h "$headers"
     sed -n '/^set(MORVIK_CLASS_HEADERS/,/)/s/^ *\([A-Za-z0-9]*\.h\).*/src\/\1/p' cmake/Install.cmake | xargs cp -t "$headers"
     abidw --exported-interfaces-only --no-comp-dir-path --no-show-locs --no-corpus-path --drop-private-types \
-        --headers-dir "$headers" "build/abi-$1/lib/lib$2.so" | xz -9 >"$3"
+        --headers-dir "$headers" "build/$1/lib/lib$2.so" | xz -9 >"$3"
 }
 
 # Address and undefined behaviour sanitizers on all tests, then valgrind, which detects reads of uninitialised memory,
@@ -149,8 +151,24 @@ memory_without() {
     scripts/build x86_64 app_test library_test src_test
     MORVIK_TEST_COMMAND=$PWD/build/sanitize/bin/morvik \
         scripts/run-tests x86_64 -L '^command$' -R '[.]' -E "$skipped|^BlockLayout|^Programs|^SelfCheck|^SelfTest|^MpiRuns"
-    uninitialised library_test 'ExactBlocks.*:*RandomBlocks.*'
-    uninitialised src_test 'Generics.*:*State.*:DumpConfig.*:Simulate.*:TDecoder3G.*:*TDecoder3GPU.*'
+    together uninitialised_blocks uninitialised_components
+}
+
+# together FUNCTION...: runs functions side by side, and shows what each printed when it ends
+together() {
+    local logs function failed=0
+    local -A running=()
+    logs=$(mktemp -d)
+    for function in "$@"; do
+        "$function" >"$logs/$function" 2>&1 &
+        running[$function]=$!
+    done
+    for function in "$@"; do
+        wait "${running[$function]}" || failed=1
+        cat "$logs/$function"
+    done
+    rm -rf "$logs"
+    return $failed
 }
 
 # sanitized FILTER PROGRAM SHARD
@@ -160,6 +178,14 @@ sanitized() {
     GTEST_TOTAL_SHARDS=$(nproc) GTEST_SHARD_INDEX=$3 "$2" --gtest_brief=1 --gtest_filter="$1" >"$log" 2>&1 ||
         { cat "$log"; return 1; }
     echo "${2##*/} $3: $(tail -n 1 "$log")"
+}
+
+uninitialised_blocks() {
+    uninitialised library_test 'ExactBlocks.*:*RandomBlocks.*'
+}
+
+uninitialised_components() {
+    uninitialised src_test 'Generics.*:*State.*:DumpConfig.*:Simulate.*:TDecoder3G.*:*TDecoder3GPU.*'
 }
 
 # uninitialised PROGRAM FILTER
@@ -305,19 +331,27 @@ stage_machines-short() {
 
 # Runs everything that is rarely run in its shortest form, so that it keeps working.
 stage_starts() {
-    tidy tests/builds/digest.cpp bench/Limits.cpp
-    local preset library
+    together starts_other_builds starts_of_product
+}
+
+starts_other_builds() {
+    local preset
     for preset in clang clang-32; do
         scripts/build "$preset" lanes_objects header_test
-    done
-    build_abi 64
-    for library in "${!interfaces[@]}"; do
-        write_abi 64 "$library" build/abi-64.renewed.xml.xz
-        compare_abi 64 "$library" build/abi-64.renewed.xml.xz
     done
     scripts/build coverage src_test
     build/coverage/tests/src_test --gtest_brief=1 --gtest_filter='*TNumberFormat.*'
     count_lines src/TNumberFormat.cpp
+}
+
+starts_of_product() {
+    tidy tests/builds/digest.cpp bench/Limits.cpp
+    local library
+    build_abi x86_64
+    for library in "${!interfaces[@]}"; do
+        write_abi x86_64 "$library" build/x86_64/renewed.xml.xz
+        compare_abi x86_64 "$library" build/x86_64/renewed.xml.xz
+    done
     scripts/mutate --only src/TNumberFormat.cpp --every 100 --anew
     scripts/packages x86_64
     scripts/validate --tables

@@ -14,6 +14,9 @@ BROUGHT = re.compile(r"^using (?:(\w+) = )?([^;=]*?(\w+)>?);", re.MULTILINE)
 
 NAMESPACE = re.compile("^using namespace .*", re.MULTILINE)
 
+# The namespace around what a source defines.
+SPACE = re.compile(r"^namespace (\w+(?:::\w+)*) \{$", re.MULTILINE)
+
 # What only one source sees. There it hides what headers declare in the namespace around it. (Comments are left out already.)
 OWN = re.compile(r"^namespace \{$(.*?)^\}  $", re.MULTILINE | re.DOTALL)
 
@@ -29,14 +32,32 @@ def names_of(pattern, text):
 
 class Names:
     """The names that a source defines, those of them that no other source sees, what those mean that only stand for another
-    name, those that it uses, and the namespaces whose names it uses unqualified."""
+    name, those that it uses, the namespaces whose names it uses unqualified, and the namespace that it is in."""
 
     def __init__(self, text):
+        self.space = min(SPACE.findall(text), default="", key=len)
         self.namespaces = set(NAMESPACE.findall(text))
         self.defined = names_of(DEFINITION, text)
         self.own = names_of(DEFINITION, "".join(OWN.findall(text)))
         self.brought = {name or last: meaning for name, meaning, last in BROUGHT.findall(text)}
         self.used = names_of(USE, text)
+
+
+def sees(space, other):
+    """Whether what is in one of two namespaces sees the names of the other without saying which."""
+    return not space or not other or f"{space}::".startswith(f"{other}::") or f"{other}::".startswith(f"{space}::")
+
+
+def agree(one, other):
+    """Whether two sources can be compiled as one, in any order."""
+    if one.namespaces and other.namespaces and one.namespaces != other.namespaces:
+        return False
+    # What both define for all to see are functions of different arguments.
+    clash = set()
+    if sees(one.space, other.space):
+        clash = one.own & (other.defined | other.used) | other.own & one.defined
+        clash = {name for name in clash if name not in one.brought or one.brought[name] != other.brought.get(name)}
+    return not (clash or one.defined & other.defined & STARTS)
 
 
 class Unit:
@@ -45,25 +66,14 @@ class Unit:
     def __init__(self, kind):
         self.kind = kind
         self.sources = []
-        self.namespaces = set()
-        self.defined = set()
-        self.own = set()
-        self.brought = {}
+        self.names = []
 
     def takes(self, kind, names):
-        # What both define for all to see are functions of different arguments.
-        clash = self.own & (names.defined | names.used) | self.defined & names.own
-        clash = {name for name in clash if name not in self.brought or self.brought[name] != names.brought.get(name)}
-        clash |= self.defined & names.defined & STARTS
-        alike = not self.namespaces or not names.namespaces or self.namespaces == names.namespaces
-        return self.kind == kind and alike and not clash
+        return self.kind == kind and all(agree(one, names) for one in self.names)
 
     def add(self, source, names):
         self.sources.append(source)
-        self.namespaces |= names.namespaces
-        self.defined |= names.defined
-        self.own |= names.own
-        self.brought.update(names.brought)
+        self.names.append(names)
 
 
 def units_of(sources, kind_of, largest):

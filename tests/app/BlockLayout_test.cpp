@@ -3,9 +3,8 @@
 
 #include <gtest/gtest.h>
 
+namespace morvik {
 namespace {
-
-using namespace morvik;
 
 TEST(BlockLayout, HasTheExampleOfTheDocuments)
 {
@@ -50,3 +49,4 @@ TEST(BlockLayout, NumberFormatsHaveTheirRanges)
 }
 
 }  // namespace
+}  // namespace morvik

@@ -8,9 +8,8 @@
 
 #include "src/InstructionSetNames.h"
 
+namespace morvik::selftest {
 namespace {
-
-using namespace morvik::selftest;
 
 /// The library, with one instruction set alone.
 Decode genericDecode(int numPu, int algorithm, const std::string& instructionSet)
@@ -165,3 +164,4 @@ TEST(SelfCheck, DigestDependsOnEveryValue)
 }
 
 }  // namespace
+}  // namespace morvik::selftest

@@ -4,9 +4,8 @@
 
 #include "support/BerTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 /// Points of two sizes where some blocks fail, with retransmissions.
 const Arguments twoSizes = words(
@@ -372,3 +371,5 @@ TEST_F(BerLink, RefusesValues)
     expectNotAllowed(
         "--redundancy-versions", "0,1,2,3,0,1,2,3,0,1,2,3,0,1,2,3,0", "there are 16 transmissions at most");
 }
+
+}  // namespace morvik::support

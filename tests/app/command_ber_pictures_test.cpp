@@ -9,9 +9,8 @@
 
 #include "support/BerTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class BerPictures : public BerTest {
 protected:
@@ -213,3 +212,4 @@ TEST_F(MergePictures, ThatCannotBeMadeAreRefusedBeforeAnythingIsWritten)
 }
 
 }  // namespace
+}  // namespace morvik::support

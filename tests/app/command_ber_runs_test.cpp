@@ -11,9 +11,8 @@
 #include "src/InstructionSetNames.h"
 #include "support/BerTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 /// Many short points of two block sizes, which end by all kinds of rules.
 const Arguments manyPoints = words(
@@ -484,3 +483,4 @@ TEST_F(BerRuns, ThatShareFramesAreNotJoined)
 }
 
 }  // namespace
+}  // namespace morvik::support

@@ -10,9 +10,8 @@
 
 #include "support/BerTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class Ber : public BerTest {
 protected:
@@ -461,3 +460,4 @@ TEST_F(Ber, ReplaysWithoutAnOutput)
 }
 
 }  // namespace
+}  // namespace morvik::support

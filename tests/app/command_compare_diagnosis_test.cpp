@@ -8,9 +8,8 @@
 #include "CompareTest.h"
 #include "Lockstep.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 /// A core with a fault, and what the command has to say of its dump.
 struct FaultCase {
@@ -621,3 +620,4 @@ TEST_F(Compare, TakesFewValuesForNoOtherRun)
 }
 
 }  // namespace
+}  // namespace morvik::support

@@ -5,9 +5,8 @@
 
 #include "CompareTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 const std::string usualCore = "core: 2 units, scaled, 4 iterations\n";
 const std::string allOf1088 = "compared 8 of 8 half-iterations, 200280 of 200280 values: all equal to the model\n";
@@ -344,3 +343,4 @@ TEST_F(Compare, NamesBadFiles)
 }
 
 }  // namespace
+}  // namespace morvik::support

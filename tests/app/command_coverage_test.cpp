@@ -5,9 +5,8 @@
 
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class Coverage : public CommandTest {
 protected:
@@ -204,3 +203,4 @@ TEST_F(Coverage, IsNotWrittenOverTheSetThatItIsOf)
 }
 
 }  // namespace
+}  // namespace morvik::support

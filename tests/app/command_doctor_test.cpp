@@ -4,9 +4,8 @@
 #include "support/Accidents.h"
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class Doctor : public CommandTest {
 protected:
@@ -298,3 +297,4 @@ TEST_F(Doctor, RefusesBadUsage)
 }
 
 }  // namespace
+}  // namespace morvik::support

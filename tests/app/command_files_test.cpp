@@ -9,9 +9,8 @@
 
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class CommandFiles : public CommandTest {
 protected:
@@ -579,3 +578,4 @@ TEST_F(CommandFiles, RefusesAReferenceThatCannotBeRead)
 }
 
 }  // namespace
+}  // namespace morvik::support

@@ -4,9 +4,8 @@
 
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class Info : public CommandTest {
 protected:
@@ -127,3 +126,4 @@ TEST_F(Info, RefusesWhatItCannotTell)
 }
 
 }  // namespace
+}  // namespace morvik::support

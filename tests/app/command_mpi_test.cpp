@@ -15,9 +15,8 @@
 
 #include "support/BerTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 /// Points of two block sizes, which end by all kinds of rules.
 const Arguments manyPoints = words(
@@ -351,3 +350,4 @@ TEST_F(MpiRuns, ExplainThemselvesOnce)
 }
 
 }  // namespace
+}  // namespace morvik::support

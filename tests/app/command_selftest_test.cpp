@@ -6,9 +6,8 @@
 #include "src/InstructionSetNames.h"
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 using SelfTest = CommandTest;
 
@@ -49,3 +48,4 @@ TEST_F(SelfTest, FindsAFaultOfTheLibrary)
 }
 
 }  // namespace
+}  // namespace morvik::support

@@ -8,9 +8,8 @@
 
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 std::size_t occurrences(const std::string& text, const std::string& part)
 {
@@ -352,3 +351,4 @@ TEST_F(Command, ShowsHelpWithoutASubcommand)
 }
 
 }  // namespace
+}  // namespace morvik::support

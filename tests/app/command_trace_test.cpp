@@ -13,9 +13,8 @@
 #include "support/CommandTest.h"
 #include "support/TraceReader.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 using morvik::signalsOf;
 using morvik::Stage;
@@ -333,3 +332,4 @@ TEST_F(Trace, TellsWhatIsWrongWithFiles)
 }
 
 }  // namespace
+}  // namespace morvik::support

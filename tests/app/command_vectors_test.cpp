@@ -7,9 +7,8 @@
 #include "base/Checksum.h"
 #include "support/CommandTest.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class Vectors : public CommandTest {
 protected:
@@ -352,3 +351,4 @@ TEST_F(Vectors, ReportsAFullDisk)
 }
 
 }  // namespace
+}  // namespace morvik::support

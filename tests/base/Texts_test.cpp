@@ -7,9 +7,8 @@
 #include "base/Numbers.h"
 #include "base/Text.h"
 
+namespace morvik::base {
 namespace {
-
-using namespace morvik::base;
 
 TEST(Numbers, AreTheWholeText)
 {
@@ -74,3 +73,4 @@ TEST(Text, ListsNeighboursAsRanges)
 }
 
 }  // namespace
+}  // namespace morvik::base

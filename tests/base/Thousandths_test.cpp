@@ -5,9 +5,8 @@
 
 #include <climits>
 
+namespace morvik::base {
 namespace {
-
-using namespace morvik::base;
 
 TEST(Thousandths, ReadsDecimals)
 {
@@ -49,3 +48,4 @@ TEST(Thousandths, ReadsWhatItWrites)
 }
 
 }  // namespace
+}  // namespace morvik::base

@@ -6,9 +6,8 @@
 #include <cmath>
 #include <numeric>
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 constexpr std::uint64_t whole = std::uint64_t{1} << AliasTable::weightBits;
 
@@ -127,3 +126,5 @@ TEST(Channel, ClipsToEightBits)
         EXPECT_EQ(soft.clipped, soft.value != rounded);
     }
 }
+
+}  // namespace morvik::link

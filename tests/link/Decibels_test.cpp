@@ -5,9 +5,8 @@
 
 #include <cmath>
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 }  // namespace
 
@@ -36,3 +35,5 @@ TEST(DecibelsTest, DecibelsOfRatiosAreRounded)
     EXPECT_EQ(milliDecibelsOf(2), 3010);
     EXPECT_EQ(milliDecibelsOf(0.5), -3010);
 }
+
+}  // namespace morvik::link

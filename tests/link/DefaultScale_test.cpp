@@ -12,9 +12,8 @@
 
 #include "morvik_v1_0_batch.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 constexpr unsigned K = 512;
 constexpr unsigned frameCount = 3000;
@@ -77,3 +76,5 @@ TEST(DefaultScale, HalfAndThreeTimesTheScaleAreWorse)
         EXPECT_GT(blockErrors(type, milliDecibels, 3 * scale), errors * 5 / 4) << type;
     }
 }
+
+}  // namespace morvik::link

@@ -9,9 +9,8 @@
 
 #include "support/SamplerForms.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 struct Received {
     std::vector<float> symbols;
@@ -127,3 +126,5 @@ TEST_P(EveryFadingChannel, IsTheOneThatHasBeenPromisedHoweverItIsCut)
 }
 
 INSTANTIATE_TEST_SUITE_P(Forms, EveryFadingChannel, everySamplerForm(), samplerFormName);
+
+}  // namespace morvik::link

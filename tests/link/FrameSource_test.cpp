@@ -14,9 +14,8 @@
 
 #include "morvik_v1_0_batch.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 Frames made(FrameSource& source, std::uint64_t first, unsigned count)
 {
@@ -243,3 +242,5 @@ TEST(FrameSource, GaussianFramesAreTheSameHoweverTheRangeIsCut)
     append(cut, made(source, 3, 67));
     expectSame(cut, whole);
 }
+
+}  // namespace morvik::link

@@ -10,9 +10,8 @@
 #include "support/ChiSquare.h"
 #include "support/SamplerForms.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 const RandomKey key = randomKey(0x123456789ABCDEF);
 
@@ -136,3 +135,5 @@ TEST(NoiseSamplerTest, NumbersAreThoseThatHaveBeenPromised)
     }
     EXPECT_EQ(digest, 0x428F6F15F1E0FB41U) << std::hex << digest;
 }
+
+}  // namespace morvik::link

@@ -7,9 +7,8 @@
 
 #include "link/random/SamplerForm.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 }  // namespace
 
@@ -68,3 +67,5 @@ TEST(Random, DrawsTheSameInBulk)
         }
     }
 }
+
+}  // namespace morvik::link

@@ -3,9 +3,8 @@
 
 #include <gtest/gtest.h>
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 }  // namespace
 
@@ -30,3 +29,5 @@ TEST(RatioScaleTest, IsAStraightLineBetweenMeasuredRates)
     EXPECT_NEAR(ratioScale(1, Modulation::qam16, 0.85), (2.7 + 2.4) / 2, 1e-12);
     EXPECT_NEAR(ratioScale(1, Modulation::qam16, 0.49999), 4.3, 1e-3);
 }
+
+}  // namespace morvik::link

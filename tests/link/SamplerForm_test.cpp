@@ -12,9 +12,8 @@
 
 #include "support/SamplerForms.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 constexpr std::int8_t guard = 0x55;
 
@@ -197,3 +196,5 @@ TEST(SamplerForm, TheMachinesFormsAreNamedAndEndWithTheGenericOne)
     EXPECT_EQ(names.size(), expected);
 #endif
 }
+
+}  // namespace morvik::link

@@ -9,9 +9,8 @@
 #include "support/ChiSquare.h"
 #include "support/SamplerForms.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 constexpr unsigned K = 512;
 constexpr int milliDecibels = 1000;
@@ -182,3 +181,5 @@ TEST(SoftValueSampler, CountsClippedValues)
         }
     }
 }
+
+}  // namespace morvik::link

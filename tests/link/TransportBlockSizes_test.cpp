@@ -5,9 +5,8 @@
 
 #include <stdexcept>
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 }  // namespace
 
@@ -53,3 +52,5 @@ TEST(TransportBlockSizesTest, SchemesAreThoseOfTheStandard)
     EXPECT_THROW(mcsOf(McsTable::qam64, 29), std::invalid_argument);
     EXPECT_THROW(mcsOf(McsTable::qam256, 28), std::invalid_argument);
 }
+
+}  // namespace morvik::link

@@ -11,9 +11,8 @@
 #include "link/ModulatedSource.h"
 #include "support/SamplerForms.h"
 
+namespace morvik::link {
 namespace {
-
-using namespace morvik::link;
 
 using Batches = std::array<CodeBlockBatch, 2>;
 
@@ -278,3 +277,5 @@ TEST(TransportSourceTest, ReceiversChoicesLeaveBitsAndNoiseAlone)
     other.codedBits += 6;
     EXPECT_NE(bitsOf(other, 1), bits);
 }
+
+}  // namespace morvik::link

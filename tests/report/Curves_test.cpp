@@ -3,9 +3,8 @@
 
 #include <gtest/gtest.h>
 
+namespace morvik::report {
 namespace {
-
-using namespace morvik::report;
 
 Row row(const Setting& setting, double ebn0)
 {
@@ -124,3 +123,5 @@ TEST(Curves, SchemesAreAFamilyIfAllHaveTheSameIterations)
     EXPECT_NE(curves[0].family, curves[1].family);
     EXPECT_EQ(curves[1].family, curves[2].family);
 }
+
+}  // namespace morvik::report

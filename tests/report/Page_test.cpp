@@ -10,9 +10,8 @@
 #include "support/SampleCurves.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::report {
 namespace {
-
-using namespace morvik::report;
 
 class Page : public testing::Test {
 protected:
@@ -135,3 +134,4 @@ TEST_F(Page, IsWrittenWhollyOrNotAtAll)
 }
 
 }  // namespace
+}  // namespace morvik::report

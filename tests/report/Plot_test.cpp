@@ -13,9 +13,8 @@
 #include "support/SampleCurves.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::report {
 namespace {
-
-using namespace morvik::report;
 
 /// What is looked up in PATH, for the lifetime of the object.
 class ProgramsIn {
@@ -251,3 +250,5 @@ TEST_F(Plot, ShowsTheThroughputBesideShannonsLimit)
     EXPECT_EQ(picture.find("Bit error rate"), std::string::npos);
     EXPECT_NE(picture.find("throughput against Es/N0"), std::string::npos) << "in the description";
 }
+
+}  // namespace morvik::report

@@ -9,9 +9,8 @@
 #include "support/CommaLocale.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::report {
 namespace {
-
-using namespace morvik::report;
 
 class Reference : public testing::Test {
 protected:
@@ -301,3 +300,4 @@ TEST_F(Reference, RefusesValuesThatAreNone)
 }
 
 }  // namespace
+}  // namespace morvik::report

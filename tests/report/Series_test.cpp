@@ -9,9 +9,8 @@
 
 #include "support/SampleCurves.h"
 
+namespace morvik::report {
 namespace {
-
-using namespace morvik::report;
 
 const Curve curve = morvik::support::sampleCurves().at(1);
 const Curve farCurve = morvik::support::sampleCurves().at(2);
@@ -220,3 +219,4 @@ TEST(Series, AreSeenAgainstIterationsWhereThereAreSome)
 }
 
 }  // namespace
+}  // namespace morvik::report

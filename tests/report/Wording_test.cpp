@@ -6,9 +6,8 @@
 #include "base/Numbers.h"
 #include "support/CommaLocale.h"
 
+namespace morvik::report {
 namespace {
-
-using namespace morvik::report;
 
 TEST(Wording, PrintableKeepsWholeCharacters)
 {
@@ -87,3 +86,4 @@ TEST(Wording, LocalesHaveNoSay)
 }
 
 }  // namespace
+}  // namespace morvik::report

@@ -5,9 +5,8 @@
 
 #include <limits>
 
+namespace morvik::rules {
 namespace {
-
-using namespace morvik::rules;
 
 constexpr std::int32_t least = std::numeric_limits<std::int32_t>::min();
 constexpr std::int32_t greatest = std::numeric_limits<std::int32_t>::max();
@@ -83,3 +82,5 @@ TEST(Arithmetic, MasksBitsOfNegativeValuesToo)
     EXPECT_EQ(maskBits(-1, -16), -16);
     EXPECT_EQ(maskBits(47, -16), 32);
 }
+
+}  // namespace morvik::rules

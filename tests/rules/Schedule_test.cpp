@@ -10,9 +10,8 @@
 #include "rules/Tail.h"
 #include "support/PlainDecoder.h"
 
+namespace morvik::rules {
 namespace {
-
-using namespace morvik::rules;
 
 TEST(Schedule, BeginsInInterleavedOrderAndEndsInNaturalOrder)
 {
@@ -60,3 +59,4 @@ TEST(Interleaver, IsThatOfThePlainDecoder)
 }
 
 }  // namespace
+}  // namespace morvik::rules

@@ -11,9 +11,8 @@
 #include "rules/Formats.h"
 #include "rules/Starts.h"
 
+namespace morvik::rules {
 namespace {
-
-using namespace morvik::rules;
 
 constexpr std::int32_t stateMask = -16;
 
@@ -132,3 +131,4 @@ TEST(Starts, FavourStateZeroOrNone)
 }
 
 }  // namespace
+}  // namespace morvik::rules

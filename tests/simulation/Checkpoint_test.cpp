@@ -12,9 +12,8 @@
 #include "base/Error.h"
 #include "support/SyntheticFrames.h"
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 PointResult resultOf(std::size_t number, std::size_t counts)
 {
@@ -142,3 +141,4 @@ TEST(Checkpoint, IsTakenOnNoTrustThoughItsChecksumIsRight)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

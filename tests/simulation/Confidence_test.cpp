@@ -6,9 +6,8 @@
 #include <cmath>
 #include <random>
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 /// The probability of at most `events` of `trials` that happen with the given rate each.
 double atMost(int events, int trials, double rate)
@@ -144,3 +143,4 @@ TEST(Confidence, OfBitsHasTheRateInIt)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

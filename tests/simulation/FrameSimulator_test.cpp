@@ -13,9 +13,8 @@
 #include "simulation/ThreadWorkers.h"
 #include "support/Blocks.h"
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 /// Wrong bits of each frame after each count of iterations, decoded one at a time.
 BatchResult oneByOne(const Plan& plan, const FrameBatch& batch)
@@ -213,3 +212,4 @@ TEST(Replay, WritesWhatWasSentAndReceived)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -3,9 +3,8 @@
 
 #include <gtest/gtest.h>
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 FrameSet framesOf(const char* text)
 {
@@ -71,3 +70,4 @@ TEST(Frames, ReadASet)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -8,9 +8,9 @@
 #include "support/SyntheticFrames.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::simulation {
 namespace {
 
-using namespace morvik::simulation;
 using Earlier = Journal::Earlier;
 using Names = std::vector<std::string>;
 
@@ -309,3 +309,4 @@ TEST_F(JournalFiles, OfOtherResultsTellWhatIsOtherIfTheyKnow)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -9,9 +9,9 @@
 #include "simulation/ResultFiles.h"
 #include "support/ExampleResults.h"
 
+namespace morvik::simulation {
 namespace {
 
-using namespace morvik::simulation;
 using morvik::support::exampleRow;
 
 Part partOf(const std::string& name, std::vector<ResultRow> rows)
@@ -150,3 +150,4 @@ TEST(Merge, KeepsTheNumbersOfPointsWhereTheyAgree)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

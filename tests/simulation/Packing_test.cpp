@@ -8,9 +8,8 @@
 
 #include "support/SyntheticFrames.h"
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 void expectEqual(const FrameBatch& got, const FrameBatch& expected)
 {
@@ -88,3 +87,4 @@ TEST(Packing, RefusesWhatIsDamaged)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

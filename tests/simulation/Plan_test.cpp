@@ -7,9 +7,8 @@
 
 #include "rules/BlockSizes.h"
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 Sweep sweepOf(std::vector<int> milliDecibels)
 {
@@ -201,3 +200,4 @@ TEST(Plan, LetsLimitsGrow)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

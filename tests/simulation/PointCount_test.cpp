@@ -9,9 +9,9 @@
 #include "support/Environment.h"
 #include "support/SyntheticFrames.h"
 
+namespace morvik::simulation {
 namespace {
 
-using namespace morvik::simulation;
 using morvik::support::countOneByOne;
 using morvik::support::expectEqual;
 using morvik::support::SyntheticFrames;
@@ -93,3 +93,4 @@ TEST(PointCount, IsTheOneOfFrameByFrame)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -11,9 +11,9 @@
 #include "support/ExampleResults.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::simulation {
 namespace {
 
-using namespace morvik::simulation;
 using morvik::support::exampleRow;
 
 const std::string header =
@@ -297,3 +297,4 @@ TEST_F(ResultFiles, RefuseTransportBlocksThatContradictThemselves)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -8,9 +8,8 @@
 #include "base/Error.h"
 #include "support/SyntheticFrames.h"
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 class Resumption : public testing::Test {
 protected:
@@ -150,3 +149,4 @@ TEST_F(Resumption, TakesNoEndedPointThatHasNot)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -13,9 +13,9 @@
 #include "support/SyntheticFrames.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::simulation {
 namespace {
 
-using namespace morvik::simulation;
 using morvik::support::countOneByOne;
 using morvik::support::SyntheticFrames;
 
@@ -317,3 +317,4 @@ TEST(Run, LeavesACheckpointWhenAWorkerFails)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

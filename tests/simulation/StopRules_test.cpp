@@ -3,9 +3,8 @@
 
 #include <gtest/gtest.h>
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 ErrorCounts countsOf(std::uint64_t bitErrors, std::uint64_t blockErrors)
 {
@@ -52,3 +51,4 @@ TEST(StopRules, TheNearestLimitTellsTheProgress)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

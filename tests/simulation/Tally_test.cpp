@@ -5,9 +5,8 @@
 
 #include <numeric>
 
+namespace morvik::simulation {
 namespace {
-
-using namespace morvik::simulation;
 
 TEST(Tally, CountsBitsBlocksAndSquares)
 {
@@ -49,3 +48,4 @@ TEST(Tally, OfTwoPartsIsThatOfAllFrames)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

@@ -9,9 +9,9 @@
 #include "simulation/Packing.h"
 #include "simulation/Replay.h"
 
+namespace morvik::simulation {
 namespace {
 
-using namespace morvik::simulation;
 namespace link = morvik::link;
 
 /// 3 code blocks of two sizes, with filler bits, at an Es/N0 where some fail.
@@ -341,3 +341,4 @@ TEST(BlockSimulator, GivesTheSameHoweverBatchesAreCut)
 }
 
 }  // namespace
+}  // namespace morvik::simulation

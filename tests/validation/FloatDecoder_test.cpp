@@ -12,9 +12,9 @@
 #include "link/random/GaussianNumber.h"
 #include "link/random/Random.h"
 
+namespace morvik::link {
 namespace {
 
-using namespace morvik::link;
 using morvik::validation::FloatDecoder;
 
 constexpr unsigned atOnce = FloatDecoder::blocksAtOnce;
@@ -122,3 +122,4 @@ TEST(FloatDecoder, RefusesOtherBlockSizes)
 }
 
 }  // namespace
+}  // namespace morvik::link

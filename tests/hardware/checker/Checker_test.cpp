@@ -14,9 +14,9 @@
 #include "support/Checkers.h"
 #include "support/TemporaryFolder.h"
 
+namespace morvik::support {
 namespace {
 
-using namespace morvik::support;
 using Messages = std::vector<std::string>;
 
 constexpr int K = 40;
@@ -527,3 +527,4 @@ TEST(Checker, KeepsABoundedNumberOfMessages)
 }
 
 }  // namespace
+}  // namespace morvik::support

@@ -5,9 +5,8 @@
 
 #include "DumpText.h"
 
+namespace morvik::comparison {
 namespace {
-
-using namespace morvik::comparison;
 
 void expectMapRefused(const std::string& json, const std::string& message)
 {
@@ -250,3 +249,4 @@ TEST(NameMap, NamesWhatIsWrong)
 }
 
 }  // namespace
+}  // namespace morvik::comparison

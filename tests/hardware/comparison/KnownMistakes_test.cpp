@@ -13,9 +13,9 @@
 #include "hardware/comparison/Replay.h"
 #include "support/Blocks.h"
 
+namespace morvik::comparison {
 namespace {
 
-using namespace morvik::comparison;
 using morvik::Stage;
 namespace blocks = morvik::blocks;
 
@@ -288,3 +288,4 @@ TEST(FittedMistakes, TellEveryMaskOfBorders)
 }
 
 }  // namespace
+}  // namespace morvik::comparison

@@ -8,9 +8,8 @@
 #include "hardware/comparison/DumpNames.h"
 #include "hardware/comparison/NamePattern.h"
 
+namespace morvik::comparison {
 namespace {
-
-using namespace morvik::comparison;
 
 constexpr unsigned alpha0 = alpha3 - 3;
 constexpr unsigned beta0 = morvik::signalsOf(morvik::Stage::backward).first;
@@ -390,3 +389,4 @@ TEST(MappedDump, NamesWhatIsWrongInAMap)
 }
 
 }  // namespace
+}  // namespace morvik::comparison

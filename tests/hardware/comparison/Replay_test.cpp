@@ -10,9 +10,9 @@
 #include "hardware/comparison/Patterns.h"
 #include "support/Blocks.h"
 
+namespace morvik::comparison {
 namespace {
 
-using namespace morvik::comparison;
 using morvik::signalCount;
 using morvik::signalsOf;
 using morvik::Stage;
@@ -153,3 +153,4 @@ TEST(Model, OrdersTheStepsOfAllSegmentsTogether)
 }
 
 }  // namespace
+}  // namespace morvik::comparison

@@ -6,9 +6,8 @@
 
 #include "DumpText.h"
 
+namespace morvik::comparison {
 namespace {
-
-using namespace morvik::comparison;
 
 /// Two units, of which the second is idle at first; the counters are those of the core.
 const std::string vcd = R"($date today $end
@@ -360,3 +359,4 @@ TEST(VcdDump, NamesThePlaceOfAMistake)
 }
 
 }  // namespace
+}  // namespace morvik::comparison

@@ -13,9 +13,9 @@
 #include "rules/BlockSizes.h"
 #include "support/Blocks.h"
 
+namespace morvik {
 namespace {
 
-using namespace morvik;
 using coverage::situations;
 
 veltra_ip_morvik_v1_0_generics genericsOf(unsigned units, unsigned algorithm)
@@ -212,3 +212,4 @@ TEST(Situations, AreSummarised)
 }
 
 }  // namespace
+}  // namespace morvik

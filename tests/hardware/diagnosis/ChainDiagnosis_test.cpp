@@ -15,10 +15,9 @@
 #include "link/coding/RateMatching.h"
 #include "support/ChainSender.h"
 
+namespace morvik::diagnosis {
 namespace {
 
-using namespace morvik;
-using namespace morvik::diagnosis;
 using morvik::support::ChainAccident;
 using morvik::support::ChainSender;
 
@@ -342,3 +341,4 @@ TEST(ChainDiagnosis, TellsWhenBitsBelongToOtherBlocks)
 }
 
 }  // namespace
+}  // namespace morvik::diagnosis

@@ -9,10 +9,9 @@
 #include "hardware/diagnosis/DiagnosisText.h"
 #include "support/Accidents.h"
 
+namespace morvik::diagnosis {
 namespace {
 
-using namespace morvik;
-using namespace morvik::diagnosis;
 using morvik::support::Accident;
 using morvik::support::SentFrame;
 
@@ -281,3 +280,4 @@ TEST(Diagnosis, FindsTheSizeOfAPaddedBlock)
 }
 
 }  // namespace
+}  // namespace morvik::diagnosis

@@ -5,9 +5,8 @@
 
 #include "support/Accidents.h"
 
+namespace morvik::diagnosis {
 namespace {
-
-using namespace morvik::diagnosis;
 
 Case caseOf(const morvik::support::SentFrame& frame)
 {
@@ -111,3 +110,4 @@ TEST(Evidence, CountsZerosByHalves)
 }
 
 }  // namespace
+}  // namespace morvik::diagnosis

@@ -6,9 +6,9 @@
 #include "hardware/units/Situations.h"
 #include "hardware/units/Stimulus.h"
 
+namespace morvik::units {
 namespace {
 
-using namespace morvik::units;
 using Values = std::vector<std::int32_t>;
 
 constexpr std::array<Number, 9> everyUnit = {Number::intrinsic,
@@ -129,3 +129,4 @@ TEST(UnitPorts, RefuseWhatTheirRegistersCannotHold)
 }
 
 }  // namespace
+}  // namespace morvik::units

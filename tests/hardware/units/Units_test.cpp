@@ -12,9 +12,9 @@
 #include "support/Checkers.h"
 #include "support/Configurations.h"
 
+namespace morvik {
 namespace {
 
-using namespace morvik;
 using Row = std::array<std::int32_t, 8>;
 using Branches = std::array<std::int32_t, 4>;
 
@@ -359,3 +359,4 @@ TEST(UnitRefusals, HaveATextEach)
 }
 
 }  // namespace
+}  // namespace morvik

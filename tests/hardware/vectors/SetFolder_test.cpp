@@ -10,9 +10,8 @@
 #include "VectorSet.h"
 #include "support/SmallFiles.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 class SetFolder : public VectorSet {};
 
@@ -240,3 +239,4 @@ TEST_F(SetFolder, CannotBeMadeInAFile)
 }
 
 }  // namespace
+}  // namespace morvik::support

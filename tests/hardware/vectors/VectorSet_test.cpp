@@ -11,9 +11,8 @@
 
 #include "VectorSet.h"
 
+namespace morvik::support {
 namespace {
-
-using namespace morvik::support;
 
 TEST_F(VectorSet, IsAsTheModelDecodes)
 {
@@ -427,3 +426,4 @@ TEST_F(VectorSet, RefusesRowsOfOtherBlocks)
 }
 
 }  // namespace
+}  // namespace morvik::support
