@@ -1,9 +1,9 @@
 #!/usr/bin/env bash
 # Runs the stages of continuous integration locally, all or the named ones.
-#   ci.sh [STAGE...]
+#   ci.sh [STAGE[+STAGE...]...]     STAGE+STAGE runs them side by side
 # Stages: format lint lint-tests docs compilers abi memory threads hostile coverage tests, and only when they are
-# named: abi-renew archives browser browser-short lint-short machines machines-short memory-short mutate packages starts
-# windows windows-short
+# named: abi-renew archives browser browser-short build lint-short machines machines-short memory-short mutate packages
+# starts windows windows-short
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -154,32 +154,6 @@ memory_without() {
     together uninitialised_blocks uninitialised_components
 }
 
-# together FUNCTION...: runs functions side by side, and shows what each printed when it ends
-together() {
-    local logs function failed=0
-    local -A running=()
-    logs=$(mktemp -d)
-    for function in "$@"; do
-        "$function" >"$logs/$function" 2>&1 &
-        running[$function]=$!
-    done
-    for function in "$@"; do
-        wait "${running[$function]}" || failed=1
-        cat "$logs/$function"
-    done
-    rm -rf "$logs"
-    return $failed
-}
-
-# sanitized FILTER PROGRAM SHARD
-sanitized() {
-    local log
-    log=$2.$3.log
-    GTEST_TOTAL_SHARDS=$(nproc) GTEST_SHARD_INDEX=$3 "$2" --gtest_brief=1 --gtest_filter="$1" >"$log" 2>&1 ||
-        { cat "$log"; return 1; }
-    echo "${2##*/} $3: $(tail -n 1 "$log")"
-}
-
 uninitialised_blocks() {
     uninitialised library_test 'ExactBlocks.*:*RandomBlocks.*'
 }
@@ -321,12 +295,21 @@ stage_machines() {
 
 # That they give the promised bits, without the command, which takes most of the time of a build.
 stage_machines-short() {
-    local preset
     scripts/setup --machines
-    for preset in aarch64 s390x; do
-        scripts/build "$preset" promised_bits
-    done
-    printf '%s\n' aarch64 s390x | xargs -P "$(nproc)" -I PRESET scripts/run-tests PRESET -R '^promised_bits$'
+    together aarch64-short s390x-short
+}
+
+aarch64-short() {
+    promised_bits_of aarch64
+}
+
+s390x-short() {
+    promised_bits_of s390x
+}
+
+promised_bits_of() {
+    scripts/build "$1" promised_bits
+    scripts/run-tests "$1" -R '^promised_bits$'
 }
 
 # Runs everything that is rarely run in its shortest form, so that it keeps working.
@@ -359,20 +342,58 @@ starts_of_product() {
     git diff --exit-code docs/validation.md docs/scale.md tests/data/ber tests/data/same_files.txt
 }
 
+# What several stages take.
+stage_build() {
+    scripts/build x86_64
+}
+
 stage_tests() {
     ./test
 }
 
+# together FUNCTION...: runs functions side by side, and shows what each printed when all have ended
+together() {
+    local logs function failed=0
+    local -A running=()
+    logs=$(mktemp -d)
+    for function in "$@"; do
+        "$function" >"$logs/$function" 2>&1 &
+        running[$function]=$!
+    done
+    for function in "$@"; do
+        wait "${running[$function]}" || failed=1
+        cat "$logs/$function"
+    done
+    rm -rf "$logs"
+    return $failed
+}
+
+# sanitized FILTER PROGRAM SHARD
+sanitized() {
+    local log
+    log=$2.$3.log
+    GTEST_TOTAL_SHARDS=$(nproc) GTEST_SHARD_INDEX=$3 "$2" --gtest_brief=1 --gtest_filter="$1" >"$log" 2>&1 ||
+        { cat "$log"; return 1; }
+    echo "${2##*/} $3: $(tail -n 1 "$log")"
+}
+
 scripts/setup --checks --tests
 [ $# -gt 0 ] || set -- format lint lint-tests docs compilers abi memory threads hostile coverage tests
-for stage in "$@"; do
-    if ! declare -F "stage_$stage" >/dev/null; then
-        stages=$(declare -F | sed -n 's/^declare -f stage_//p')
-        echo "ci.sh: no stage '$stage'; stages are "$stages >&2
-        exit 2
-    fi
-    echo "== $stage"
+for step in "$@"; do
+    IFS=+ read -ra stages <<<"$step"
+    for stage in "${stages[@]}"; do
+        if ! declare -F "stage_$stage" >/dev/null; then
+            known=$(declare -F | sed -n 's/^declare -f stage_//p')
+            echo "ci.sh: no stage '$stage'; stages are "$known >&2
+            exit 2
+        fi
+    done
+    echo "== $step"
     begun=$SECONDS
-    "stage_$stage"
-    echo "== $stage: $((SECONDS - begun)) s"
+    if [ ${#stages[@]} -eq 1 ]; then
+        "stage_$step"
+    else
+        together "${stages[@]/#/stage_}"
+    fi
+    echo "== $step: $((SECONDS - begun)) s"
 done
