@@ -151,15 +151,19 @@ memory_without() {
     scripts/build x86_64 app_test library_test src_test
     MORVIK_TEST_COMMAND=$PWD/build/sanitize/bin/morvik \
         scripts/run-tests x86_64 -L '^command$' -R '[.]' -E "$skipped|^BlockLayout|^Programs|^SelfCheck|^SelfTest|^MpiRuns"
-    together uninitialised_blocks uninitialised_components
+    export -f uninitialised
+    printf '%s\n' library_test 'ExactBlocks.*:*RandomBlocks.*' \
+        src_test 'Generics.*:*State.*:DumpConfig.*:Simulate.*:TDecoder3G.*:*TDecoder3GPU.*' |
+        xargs -P "$(nproc)" -n 2 bash -euo pipefail -c 'uninitialised "$@"' uninitialised
 }
 
-uninitialised_blocks() {
-    uninitialised library_test 'ExactBlocks.*:*RandomBlocks.*'
-}
-
-uninitialised_components() {
-    uninitialised src_test 'Generics.*:*State.*:DumpConfig.*:Simulate.*:TDecoder3G.*:*TDecoder3GPU.*'
+# sanitized FILTER PROGRAM SHARD
+sanitized() {
+    local log
+    log=$2.$3.log
+    GTEST_TOTAL_SHARDS=$(nproc) GTEST_SHARD_INDEX=$3 "$2" --gtest_brief=1 --gtest_filter="$1" >"$log" 2>&1 ||
+        { cat "$log"; return 1; }
+    echo "${2##*/} $3: $(tail -n 1 "$log")"
 }
 
 # uninitialised PROGRAM FILTER
@@ -296,17 +300,12 @@ stage_machines() {
 # That they give the promised bits, without the command, which takes most of the time of a build.
 stage_machines-short() {
     scripts/setup --machines
-    together aarch64-short s390x-short
+    export -f promised_bits_of
+    printf '%s\n' aarch64 s390x |
+        xargs -P "$(nproc)" -n 1 bash -euo pipefail -c 'promised_bits_of "$@"' promised_bits_of
 }
 
-aarch64-short() {
-    promised_bits_of aarch64
-}
-
-s390x-short() {
-    promised_bits_of s390x
-}
-
+# promised_bits_of PRESET
 promised_bits_of() {
     scripts/build "$1" promised_bits
     scripts/run-tests "$1" -R '^promised_bits$'
@@ -366,15 +365,6 @@ together() {
     done
     rm -rf "$logs"
     return $failed
-}
-
-# sanitized FILTER PROGRAM SHARD
-sanitized() {
-    local log
-    log=$2.$3.log
-    GTEST_TOTAL_SHARDS=$(nproc) GTEST_SHARD_INDEX=$3 "$2" --gtest_brief=1 --gtest_filter="$1" >"$log" 2>&1 ||
-        { cat "$log"; return 1; }
-    echo "${2##*/} $3: $(tail -n 1 "$log")"
 }
 
 scripts/setup --checks --tests

@@ -49,7 +49,7 @@ def sees(space, other):
 
 
 def agree(one, other):
-    """Whether two sources can be compiled as one, in any order."""
+    """Whether two sources can be compiled as one, `other` after `one`."""
     if one.namespaces and other.namespaces and one.namespaces != other.namespaces:
         return False
     # What both define for all to see are functions of different arguments.
