@@ -1,6 +1,7 @@
 // Limits: the limit of this machine, as measured by the probe in this run.
 #include "Limits.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 
@@ -8,6 +9,7 @@
 #include "Probe.h"
 #include "lanes/InstructionSets.h"
 #include "rules/Cut.h"
+#include "rules/Trellis.h"
 
 // Each compilation of Probe.cpp defines one of these.
 #define MORVIK_INSTRUCTION_SET(name, flags, isAvailable) \
@@ -45,11 +47,12 @@ const lanes::InstructionSet* instructionSet(const std::string& name)
     return nullptr;
 }
 
-/// Lanes of the vectors used by the work.
+/// Lanes of the vectors used by the work; those of a single segment hold its states.
 unsigned vectorLanes(const Work& work, const lanes::InstructionSet& set)
 {
     const unsigned segments = rules::Cut(work.blockSize, static_cast<unsigned>(work.units)).segments();
-    return lanes::kernelFor(set, segments, work.call == Work::Call::batch ? work.blocks : 1).vectorLanes;
+    const unsigned blocks = work.call == Work::Call::batch ? work.blocks : 1;
+    return std::max(lanes::kernelFor(set, segments, blocks).vectorLanes, rules::stateCount);
 }
 
 }  // namespace

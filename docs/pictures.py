@@ -361,8 +361,8 @@ def flow():
                           ("A slice for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareWork", "lanes/SizeTables.cpp: write",
                            "lanes/Transpose.h: fillSlices"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
-                           "lanes/Kernels.cpp: decode, runPasses"),
-                          ("A pass, window by window", "lanes/Pass.h: runPass, forwardStep, backwardStep",
+                           "lanes/Kernels.cpp: decode, forPasses"),
+                          ("A pass, window by window", "lanes/Pass.h: runPass, forwardStep, backwardStep", "lanes/StatePass.h: run",
                            "lanes/Rules.h: Greatest, Corrected", "lanes/Machine.h: Permutation"),
                           ("Decisions", "src/LanePath.cpp: decisions, ratios", "lanes/LaneDecoder.cpp: spread"))
     lanes.again(left[2] + 32, left[3] - 12, "2 x iterations")

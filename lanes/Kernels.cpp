@@ -5,11 +5,43 @@
 #include <iterator>
 
 #include "Pass.h"
+#include "StatePass.h"
 #include "Transpose.h"
 #include "rules/Schedule.h"
 
 namespace morvik::lanes::MORVIK_LANES {
 namespace {
+
+/// Calls run(ratios, d, joint, isFirst) for passes. Even ones belong to decoder 1, odd ones to decoder 0 (rule 15).
+/// Pass 0 has no a-priori values.
+template <class Run>
+MORVIK_INLINE void forPasses(const Workspace& workspace, unsigned from, unsigned to, Run run)
+{
+    for (unsigned h = from; h < to; ++h) {
+        const unsigned d = rules::constituentOf(h);
+        const Constituent& other = workspace.constituent[1 - d];
+        const std::int16_t* joint = h == 0 ? other.systematic : other.joint;
+        if (h + 1 < to) {
+            run(std::integral_constant<Ratios, Ratios::dropped>{}, d, joint, rules::isFirstPass(h));
+        } else {
+            run(std::integral_constant<Ratios, Ratios::kept>{}, d, joint, rules::isFirstPass(h));
+        }
+    }
+}
+
+/// Decodes by Kernel::decodeBy<rule, extrinsic>.
+template <class Kernel>
+void decodeBy(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to)
+{
+    switch (algorithm) {
+    case Algorithm::greatest:
+        return Kernel::template decodeBy<Greatest, Extrinsic::whole>(workspace, from, to);
+    case Algorithm::greatestScaled:
+        return Kernel::template decodeBy<Greatest, Extrinsic::scaled>(workspace, from, to);
+    case Algorithm::corrected:
+        return Kernel::template decodeBy<Corrected, Extrinsic::whole>(workspace, from, to);
+    }
+}
 
 /// The kernel of a shape (Machine.h).
 template <class OfShape>
@@ -42,25 +74,27 @@ struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
         if (from == 0) {
             interleave(workspace);
         }
-        switch (algorithm) {
-        case Algorithm::greatest:
-            return decodeBy<Greatest, plainAbreast, Extrinsic::whole>(workspace, from, to);
-        case Algorithm::greatestScaled:
-            return decodeBy<Greatest, plainAbreast, Extrinsic::scaled>(workspace, from, to);
-        case Algorithm::corrected:
-            return decodeBy<Corrected, correctedAbreast, Extrinsic::whole>(workspace, from, to);
-        }
+        lanes::MORVIK_LANES::decodeBy<KernelOf>(workspace, algorithm, from, to);
+    }
+
+    template <template <unsigned> class RuleOf, Extrinsic extrinsic>
+    static void decodeBy(const Workspace& workspace, unsigned from, unsigned to)
+    {
+        decodeAbreast<RuleOf, RuleOf<count>::corrects ? correctedAbreast : plainAbreast, extrinsic>(
+            workspace, from, to);
     }
 
     template <template <unsigned> class RuleOf, unsigned abreast, Extrinsic extrinsic>
-    static void decodeBy(const Workspace& workspace, unsigned from, unsigned to)
+    static void decodeAbreast(const Workspace& workspace, unsigned from, unsigned to)
     {
         if constexpr (abreast > 1) {
             if (!pays(workspace, abreast)) {
-                return decodeBy<RuleOf, abreast / 2, extrinsic>(workspace, from, to);
+                return decodeAbreast<RuleOf, abreast / 2, extrinsic>(workspace, from, to);
             }
         }
-        runPasses<RuleOf, abreast, extrinsic>(workspace, from, to);
+        forPasses(workspace, from, to, [&](auto ratios, unsigned d, const std::int16_t* joint, bool isFirst) {
+            runPass<RuleOf, count, vectors, abreast, extrinsic, ratios>(workspace, d, joint, isFirst);
+        });
     }
 
     /// Whether `abreast` windows should run side by side rather than half as many. The last window may start from a
@@ -104,24 +138,6 @@ struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
         }
     }
 
-    /// Even passes belong to decoder 1, odd ones to decoder 0 (rule 15). Pass 0 has no a-priori values.
-    template <template <unsigned> class RuleOf, unsigned abreast, Extrinsic extrinsic>
-    static void runPasses(const Workspace& workspace, unsigned from, unsigned to)
-    {
-        for (unsigned h = from; h < to; ++h) {
-            const unsigned d = rules::constituentOf(h);
-            const Constituent& other = workspace.constituent[1 - d];
-            const std::int16_t* joint = h == 0 ? other.systematic : other.joint;
-            if (h + 1 < to) {
-                runPass<RuleOf, count, vectors, abreast, extrinsic, Ratios::dropped>(
-                    workspace, d, joint, rules::isFirstPass(h));
-            } else {
-                runPass<RuleOf, count, vectors, abreast, extrinsic, Ratios::kept>(
-                    workspace, d, joint, rules::isFirstPass(h));
-            }
-        }
-    }
-
     static constexpr unsigned slotBytes =
         Pass<Greatest, count, vectors, std::max(plainAbreast, correctedAbreast), Extrinsic::whole>::slotBytes;
     /// For the larger rule, which keeps a pending correction with each metric.
@@ -135,6 +151,58 @@ struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
                                       slotBytes,
                                       forwardBytes,
                                       Permutation::prepare,
+                                      fill<std::int32_t>,
+                                      fill<std::int16_t>,
+                                      fill<std::int8_t>,
+                                      decode,
+                                      spread<std::uint8_t>,
+                                      spread<std::int16_t>};
+};
+
+/// For a single lane.
+template <>
+struct KernelOf<Shape<1, 1>> {
+    static void prepare(const std::uint8_t*, std::uint8_t*) {}
+
+    template <class Input>
+    static bool fill(const Input* const* arrays, unsigned steps, std::int16_t* slices)
+    {
+        return fillSteps(arrays[0], steps, slices);
+    }
+
+    template <class Output>
+    static void spread(const std::int16_t* slices, unsigned steps, Output* const* arrays)
+    {
+        spreadSteps(slices, steps, arrays[0]);
+    }
+
+    static void decode(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to)
+    {
+        if (from == 0) {
+            const Constituent& interleaved = workspace.constituent[1];
+            for (std::size_t i = 0; i < workspace.steps; ++i) {
+                interleaved.systematic[i] = workspace.constituent[0].systematic[interleaved.interleaver.sources[i]];
+            }
+        }
+        lanes::MORVIK_LANES::decodeBy<KernelOf>(workspace, algorithm, from, to);
+    }
+
+    template <template <unsigned> class RuleOf, Extrinsic extrinsic>
+    static void decodeBy(const Workspace& workspace, unsigned from, unsigned to)
+    {
+        forPasses(workspace, from, to, [&](auto ratios, unsigned d, const std::int16_t* joint, bool) {
+            runPass<RuleOf, extrinsic, ratios>(workspace, d, joint);
+        });
+    }
+
+    static constexpr Kernel kernel = {1,
+                                      1,
+                                      1,
+                                      1,
+                                      0,
+                                      StatePass<Greatest, Extrinsic::whole>::slotBytes,
+                                      0,
+                                      prepare,
                                       fill<std::int32_t>,
                                       fill<std::int16_t>,
                                       fill<std::int8_t>,

@@ -49,8 +49,9 @@ constexpr std::int16_t halfOfScale = rules::scaleNumerator << (15 - rules::scale
 
 struct Portable {
     using VectorLanes = std::integer_sequence<unsigned, 8>;
-    using Kernels = Shapes<Shape<8, 1>, Shape<8, 2>, Shape<8, 4>>;
+    using Kernels = Shapes<Shape<1, 1>, Shape<8, 1>, Shape<8, 2>, Shape<8, 4>>;
     static constexpr bool holdsTwoRecursions = false;
+    static constexpr unsigned pairedLanes = 0;
     static constexpr unsigned tileHalves = 1;
 
     /// The control holds the source lanes themselves.
@@ -105,6 +106,13 @@ struct Portable {
         Eighths<count> itsDrops[drops];
     };
 
+    /// Half i of a, and half j of b.
+    template <unsigned i, unsigned j, unsigned count>
+    static MORVIK_INLINE Eighths<count> halves(Eighths<count> a, Eighths<count> b)
+    {
+        return join(part<count / 2, i>(a), part<count / 2, j>(b));
+    }
+
     template <unsigned count>
     static MORVIK_INLINE Eighths<count> scaledHalf(Eighths<count> a)
     {
@@ -156,7 +164,7 @@ struct ByteShuffles : Section {
                 return shuffleBytes(first, Eighths<count>{shuffle});
             } else {
                 const Group second = Group::load(slices + from[1]);
-                return shuffleBytes(inserted(first, second), Eighths<count>{shuffle});
+                return shuffleBytes(join(first, second), Eighths<count>{shuffle});
             }
         }
     };
@@ -224,8 +232,8 @@ struct Ssse3 : ByteShuffles<Sse2> {};
 // ---- AVX2: vectors of sixteen lanes
 
 #if defined(__AVX2__)
-/// Joins two vectors into one.
-MORVIK_INLINE Eighths<16> inserted(Eighths<8> a, Eighths<8> b)
+/// Preferred to the template, for which g++ finds longer ways.
+MORVIK_INLINE Eighths<16> join(Eighths<8> a, Eighths<8> b)
 {
     return {(Raw<16>::Signed)_mm256_set_m128i((__m128i)b.v, (__m128i)a.v)};
 }
@@ -244,8 +252,19 @@ MORVIK_INLINE Eighths<16> clippedFrom(int lo, int hi, Eighths<16> a)
 
 struct Avx2 : Ssse3 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16>;
-    using Kernels = Shapes<Shape<8, 1, 2>, Shape<16, 1>, Shape<16, 2>>;
+    using Kernels = Shapes<Shape<1, 1>, Shape<8, 1, 2>, Shape<16, 1>, Shape<16, 2>>;
+    static constexpr unsigned pairedLanes = 8;
     static constexpr unsigned tileHalves = 2;
+
+    template <unsigned i, unsigned j>
+    static MORVIK_INLINE Eighths<16> halves(Eighths<16> a, Eighths<16> b)
+    {
+        if constexpr (i == 0 && j == 1) {
+            return {(Raw<16>::Signed)_mm256_blend_epi32((__m256i)a.v, (__m256i)b.v, 0xF0)};
+        } else {
+            return {(Raw<16>::Signed)_mm256_permute2x128_si256((__m256i)a.v, (__m256i)b.v, i | (2 + j) << 4)};
+        }
+    }
 
     using Ssse3::scaledHalf;
     static MORVIK_INLINE Eighths<16> scaledHalf(Eighths<16> a)
@@ -282,8 +301,11 @@ MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> b, Eighths<32>
 struct Avx512 : Avx2 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16, 32>;
     static constexpr bool holdsTwoRecursions = sizeof(void*) == 8;  // 32-bit code has eight registers
-    using Kernels =
-        Shapes<Shape<8, 1, 2, 4>, Shape<16, 1, (holdsTwoRecursions ? 1 : 2), 2>, Shape<32, 1>, Shape<32, 2>>;
+    using Kernels = Shapes<Shape<1, 1>,
+                           Shape<8, 1, 2, 4>,
+                           Shape<16, 1, (holdsTwoRecursions ? 1 : 2), 2>,
+                           Shape<32, 1>,
+                           Shape<32, 2>>;
 
     /// An index word for each lane.
     template <unsigned count>

@@ -5,19 +5,15 @@
 #include <cstddef>
 
 #include "Bounds.h"
+#include "Extrinsics.h"
 #include "Machine.h"
+#include "PairedStates.h"
 #include "Rules.h"
 #include "Words.h"
 #include "Workspace.h"
 #include "rules/Trellis.h"
 
 namespace morvik::lanes::MORVIK_LANES {
-
-/// Whether extrinsic values are passed on unscaled, or times the scale of rules/Algorithms.h (rule 14).
-enum class Extrinsic { whole, scaled };
-
-/// Whether a pass keeps its ratios, as the last one does.
-enum class Ratios { dropped, kept };
 
 /// Runs a pass over slices of `vectors` vectors of `count` lanes. All lanes work on the same window of their segments.
 /// The forward recursion stores its metrics in slots, one for each step; the backward recursion reads them and computes
@@ -33,18 +29,23 @@ class Pass {
     using Value = Eighths<count>;
     using WideValue = Eighths<wide>;
     using Permutation = Machine::Permutation<count>;
-    using Rule = RuleOf<count>;
     using WideRule = RuleOf<wide>;
-    using Decision = typename Rule::Decision;
+    using Decision = typename RuleOf<count>::Decision;
     using WideDecision = typename WideRule::Decision;
     using Column = rules::Column<Decision>;
     using WideColumn = rules::Column<WideDecision>;
 
-    /// The layout of a slot: eight forward metrics, two branch metrics (the other two repeat them: LTE
-    /// has no second parity stream, rule 5) and the joint value.
+    /// Whether the forward recursion has two states in a vector.
+    static constexpr bool paired = count == Machine::pairedLanes;
+    using Paired = PairedStates<RuleOf, count>;
+    using ForwardRule = RuleOf<paired ? 2 * count : count>;
+
+    /// The layout of a slot: eight forward metrics, two branch metrics (the other two repeat them) and the joint value,
+    /// each with its windows side by side. Those of a recursion with two states in a vector have one window after the
+    /// other, the metrics in their places.
     static constexpr unsigned slotBranches = states * wide;
     static constexpr unsigned slotJoint = slotBranches + 2 * wide;
-    static constexpr unsigned slotWords = slotJoint + wide;
+    static constexpr unsigned slotWords = slotJoint + (paired && abreast == 1 ? 2 * wide : wide);
 
 public:
     /// Memory needed in the workspace: for a step of a window, and for the forward recursion between two windows.
@@ -157,7 +158,7 @@ private:
                 a = start;
             }
             start = a;
-            forward(windows, j, a);
+            runForward(windows, j, a);
             a = broughtBack<Decision>(a);
         }
         saveForward(windows.v, a);
@@ -165,7 +166,16 @@ private:
 
     MORVIK_INLINE void runForward(const Windows& windows) const
     {
-        runForward(windows, [&](Column& a) MORVIK_INLINE_LAMBDA { forward(windows, 0, a); });
+        runForward(windows, [&](Column& a) MORVIK_INLINE_LAMBDA { runForward(windows, 0, a); });
+    }
+
+    MORVIK_INLINE void runForward(const Windows& windows, unsigned j, Column& a) const
+    {
+        if constexpr (paired) {
+            forwardInPairs(windows, j, a);
+        } else {
+            forward(windows, j, a);
+        }
     }
 
     /// Runs the backward recursion of windows, together with the forward recursion of the next one if registers
@@ -180,7 +190,11 @@ private:
             }
             backward<ratios>(windows, windows.length - next.length, b);
         } else {
-            backward<ratios>(windows, windows.length, b);
+            if constexpr (paired) {
+                backwardInPairs<ratios>(windows, b);
+            } else {
+                backward<ratios>(windows, windows.length, b);
+            }
             if (next.length != 0) {
                 runForward(next);
             }
@@ -188,7 +202,7 @@ private:
         storeReached(windows, b);
     }
 
-    static constexpr bool overlapped = Machine::holdsTwoRecursions && Rule::fewRegisters;
+    static constexpr bool overlapped = Machine::holdsTwoRecursions && !WideRule::corrects && !paired;
 
     MORVIK_INLINE void forward(const Windows& windows, unsigned j, Column& a) const
     {
@@ -199,6 +213,28 @@ private:
         }
     }
 
+    /// The same with two states in a vector. Not inlined, since its addresses take most of the registers.
+    MORVIK_INLINE_CALLS void forwardInPairs(const Windows& windows, unsigned j, Column& a) const
+    {
+        const Pass own(*this);  // no store can change it, so that its members stay in registers
+        Paired pairs(a);
+        std::int16_t* slot = itsSlots + windows.slot;
+        const std::ptrdiff_t direction = windows.direction;
+        std::size_t i = at(windows, j, 0);
+        const std::size_t end = i + windows.length;
+        const auto step = [&](auto steps) MORVIK_INLINE_LAMBDA {
+            if (i != end) {
+                own.template pairedStep<steps>(i, slot, j, pairs);
+                slot += direction;
+                ++i;
+            }
+        };
+        while (i != end) {
+            rules::forEach<Paired::turn>(step);
+        }
+        a = pairs.column(windows.length);
+    }
+
     /// Runs the backward recursion over the first `steps` steps of the windows.
     template <Ratios ratios>
     MORVIK_INLINE void backward(const Windows& windows, unsigned steps, WideColumn& b) const
@@ -207,6 +243,30 @@ private:
         for (std::size_t i = steps; i-- > 0;) {
             slot -= windows.direction;
             backwardStep<ratios>(windows, i, slot, b);
+        }
+    }
+
+    template <Ratios ratios>
+    MORVIK_INLINE void backwardInPairs(const Windows& windows, WideColumn& b) const
+    {
+        std::size_t i = windows.length;
+        const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
+        const auto step = [&](auto steps) MORVIK_INLINE_LAMBDA {
+            slot -= windows.direction;
+            --i;
+            backwardStep<ratios, steps>(windows, i, slot, b);
+        };
+        while (i != 0) {
+            switch (i % Paired::turn) {
+            case 0:
+                step(std::integral_constant<unsigned, 2>{});
+                [[fallthrough]];
+            case 2:
+                step(std::integral_constant<unsigned, 1>{});
+                [[fallthrough]];
+            default:
+                step(std::integral_constant<unsigned, 0>{});
+            }
         }
     }
 
@@ -227,11 +287,8 @@ private:
     /// Runs step `i` of all vectors' steps. `slot` points to the window's lanes.
     MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a) const
     {
-        const std::uint32_t* const sources = itsInterleaver.sources + i * Permutation::sources;
-        __builtin_prefetch(itsSource + sources[fetchAhead * Permutation::sources]);
-        const Value joint = Permutation::gather(itsSource, sources, itsInterleaver.controls + i * Permutation::bytes);
-        BranchMetrics<count> g = rules::branchSums(joint, Value::load(itsParity + i * count), Value{});
-        rules::clipBranches(g, branchMin, branchMax);
+        const Value joint = jointAt(i);
+        const BranchMetrics<count> g = branchMetrics(joint, Value::load(itsParity + i * count));
         rules::forEach<states>([&](auto state)
                                    MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * wide); });
         g[0].store(slot + slotBranches);
@@ -240,29 +297,72 @@ private:
         a = rules::forwardStep(itsRule.decision(), a, g);
     }
 
-    template <Ratios ratios>
+    /// The same for window `j` of a slot, after `steps` steps of it.
+    template <unsigned steps>
+    MORVIK_INLINE void pairedStep(std::size_t i, std::int16_t* slot, unsigned j, Paired& pairs) const
+    {
+        const Value joint = jointAt(i);
+        const BranchMetrics<count> sums = rules::branchSums(joint, Value::load(itsParity + i * count), Value{});
+        const Eighths<2 * count> g = clip(join(sums[0], sums[1]), branchMin, branchMax);
+        pairs.store(slot + j * states * count);
+        g.store(slot + slotBranches + j * 2 * count);
+        joint.store(slot + slotJoint + j * count);
+        pairs.template step<steps>(itsRule.decision(), g);
+    }
+
+    MORVIK_INLINE Value jointAt(std::size_t i) const
+    {
+        const std::uint32_t* const sources = itsInterleaver.sources + i * Permutation::sources;
+        __builtin_prefetch(itsSource + sources[fetchAhead * Permutation::sources]);
+        return Permutation::gather(itsSource, sources, itsInterleaver.controls + i * Permutation::bytes);
+    }
+
+    /// The metrics of a slot, after `steps` steps of a window if they are in pairs.
+    template <unsigned steps>
+    struct Slot {
+        const std::int16_t* words;
+
+        /// The forward metric of a state.
+        MORVIK_INLINE WideValue operator[](unsigned state) const
+        {
+            if constexpr (paired) {
+                return ofWindows(words + Paired::place(state, steps) * count, states * count);
+            } else {
+                return WideValue::load(words + state * wide);
+            }
+        }
+
+        MORVIK_INLINE WideValue branch(unsigned metric) const
+        {
+            if constexpr (paired) {
+                return ofWindows(words + slotBranches + metric * count, 2 * count);
+            } else {
+                return WideValue::load(words + slotBranches + metric * wide);
+            }
+        }
+    };
+
+    /// Joins a value of each window, `distance` words from one to the next.
+    static MORVIK_INLINE WideValue ofWindows(const std::int16_t* first, unsigned distance)
+    {
+        return joined<0, abreast>([&](unsigned j) MORVIK_INLINE_LAMBDA { return Value::load(first + j * distance); });
+    }
+
+    template <Ratios ratios, unsigned steps = 0>
     MORVIK_INLINE void backwardStep(const Windows& windows,
                                     std::size_t i,
-                                    const std::int16_t* slot,
+                                    const std::int16_t* words,
                                     WideColumn& b) const
     {
-        const WideValue g0 = WideValue::load(slot + slotBranches);
-        const WideValue g1 = WideValue::load(slot + slotBranches + wide);
-        const WideValue ratio = itsWideRule.stepBack({slot}, b, {g0, g1, g1, g0});
+        const Slot<steps> slot = {words};
+        const WideValue g0 = slot.branch(0);
+        const WideValue g1 = slot.branch(1);
+        const WideValue ratio = itsWideRule.stepBack(slot, b, {g0, g1, g1, g0});
         if constexpr (ratios == Ratios::kept) {
             storeValues(windows, i, ratio, itsRatios);
         }
-        const WideValue joint = WideValue::load(slot + slotJoint);
-        storeValues(windows, i, nextJoint(ratio, joint, valuesAt(windows, i, itsSystematic)), itsJoint);
-    }
-
-    /// The extrinsic value x = ratio - 2 joint is scaled, rounded down and clipped (rule 14), then halved and rounded
-    /// down again in the other decoder (rule 13): one rounding suffices.
-    static MORVIK_INLINE WideValue nextJoint(WideValue ratio, WideValue joint, WideValue systematic)
-    {
-        const WideValue x = ratio - (joint + joint);
-        const WideValue half = extrinsic == Extrinsic::scaled ? Machine::scaledHalf(x) : x >> 1;
-        return clip(half, branchMin / 2, branchMax / 2) + systematic;
+        const WideValue joint = WideValue::load(words + slotJoint);
+        storeValues(windows, i, nextJoint<extrinsic>(ratio, joint, valuesAt(windows, i, itsSystematic)), itsJoint);
     }
 
     /// Returns the index of step `i` of window `j` among the steps of all vectors.
@@ -400,7 +500,7 @@ private:
     std::int16_t* const itsJoint;
     std::int16_t* const itsRatios;
     std::int16_t* const itsSlots;
-    const Rule itsRule;
+    const ForwardRule itsRule;
     const WideRule itsWideRule;
 };
 

@@ -15,23 +15,12 @@ using StateMetrics = std::array<Eighths<count>, rules::stateCount>;
 template <unsigned count>
 using BranchMetrics = rules::BranchMetrics<Eighths<count>>;
 
-/// The eight metrics of a slot, contiguous in memory.
-template <unsigned count>
-struct StoredColumn {
-    const std::int16_t* metrics;
-
-    MORVIK_INLINE Eighths<count> operator[](unsigned state) const
-    {
-        return Eighths<count>::load(metrics + state * count);
-    }
-};
-
 /// "MOD": max-log-MAP.
 template <unsigned countOfLanes>
 struct Greatest {
     static constexpr unsigned count = countOfLanes;
     using Decision = rules::DecideMax<Eighths<count>>;
-    static constexpr bool fewRegisters = true;
+    static constexpr bool corrects = false;
 
     explicit MORVIK_INLINE Greatest(const std::uint8_t*) {}
 
@@ -40,9 +29,11 @@ struct Greatest {
         return {};
     }
 
-    /// Moves b a step back and returns the step's ratio. The maximum depends neither on the order of comparison nor on
-    /// when the branch metric is added, so the candidates of the backward recursion are reused, pair by pair.
-    MORVIK_INLINE Eighths<count> stepBack(const StoredColumn<count>& a,
+    /// Moves b a step back and returns the step's ratio; a[state] is a forward metric before it. The maximum depends
+    /// neither on the order of comparison nor on when the branch metric is added, so the candidates of the backward
+    /// recursion are reused, pair by pair.
+    template <class Stored>
+    MORVIK_INLINE Eighths<count> stepBack(const Stored& a,
                                           rules::Column<Decision>& b,
                                           const BranchMetrics<count>& g) const
     {
@@ -66,7 +57,7 @@ struct Corrected {
     static constexpr unsigned count = countOfLanes;
     using Corrections = Machine::Corrections<count>;
     using Decision = rules::DecideMaxHash<Eighths<count>, Corrections>;
-    static constexpr bool fewRegisters = false;
+    static constexpr bool corrects = true;
     Corrections corrections;
 
     explicit MORVIK_INLINE Corrected(const std::uint8_t* table) : corrections(table) {}
@@ -76,9 +67,11 @@ struct Corrected {
         return Decision(corrections);
     }
 
-    /// Moves b a step back and returns the step's ratio. The states of a pair share their branch metric, which changes
-    /// neither their difference nor the winner, so the candidates of the backward recursion are reused here, too.
-    MORVIK_INLINE Eighths<count> stepBack(const StoredColumn<count>& a,
+    /// Moves b a step back and returns the step's ratio, as above. The states of a pair share their branch metric,
+    /// which changes neither their difference nor the winner, so the candidates of the backward recursion are reused
+    /// here, too.
+    template <class Stored>
+    MORVIK_INLINE Eighths<count> stepBack(const Stored& a,
                                           rules::Column<Decision>& b,
                                           const BranchMetrics<count>& g) const
     {

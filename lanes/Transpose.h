@@ -117,6 +117,26 @@ MORVIK_INLINE typename AnyTile::Vector inputVector(const Input* const* arrays,
     return words;
 }
 
+/// Whether no value set a bit above the low eight (inputVector).
+template <class AnyTile>
+bool allWithin(const typename AnyTile::Unsigned& beyond)
+{
+    unsigned any = 0;
+    for (unsigned i = 0; i < AnyTile::lanes; ++i) {
+        any |= beyond[i];
+    }
+    return any < 256;
+}
+
+/// Calls take(k) for the first of each eight steps. The last eight may overlap those before them.
+template <class Take>
+MORVIK_INLINE void byEight(unsigned steps, Take take)
+{
+    for (unsigned next = 0; next < steps; next += 8) {
+        take(next + 8 <= steps ? next : steps - 8);
+    }
+}
+
 /// Fills slices of `count` values, a multiple of eight, from as many arrays of `steps` values each, eight or more.
 /// Returns false if a value was outside the input format: the slices are then invalid.
 template <unsigned count, class Input>
@@ -125,8 +145,7 @@ bool fillSlices(const Input* const* arrays, unsigned steps, std::int16_t* slices
     using BestTile = TileOf<count>;
     typename BestTile::Unsigned beyond{};
     for (unsigned lane = 0; lane < count; lane += BestTile::lanes) {
-        for (unsigned next = 0; next < steps; next += BestTile::size) {
-            const unsigned k = next + BestTile::size <= steps ? next : steps - BestTile::size;
+        byEight(steps, [&](unsigned k) MORVIK_INLINE_LAMBDA {
             BestTile tile;
             for (unsigned i = 0; i < BestTile::size; ++i) {
                 tile[i] = inputVector<BestTile>(arrays + lane + i, k, beyond);
@@ -135,47 +154,76 @@ bool fillSlices(const Input* const* arrays, unsigned steps, std::int16_t* slices
             for (unsigned i = 0; i < BestTile::size; ++i) {
                 std::memcpy(slices + (k + i) * count + lane, &tile[i], sizeof tile[i]);
             }
+        });
+    }
+    return allWithin<BestTile>(beyond);
+}
+
+/// Fills slices of one value from an array, as above.
+template <class Input>
+bool fillSteps(const Input* array, unsigned steps, std::int16_t* slices)
+{
+    Tile<1>::Unsigned beyond{};
+    byEight(steps, [&](unsigned k) MORVIK_INLINE_LAMBDA {
+        const Tile<1>::Vector words = inputVector<Tile<1>>(&array, k, beyond);
+        std::memcpy(slices + k, &words, sizeof words);
+    });
+    return allWithin<Tile<1>>(beyond);
+}
+
+template <class Output, unsigned lanes>
+struct OutputsOf {
+    typedef Output Outputs __attribute__((vector_size(lanes * sizeof(Output))));
+
+    /// Ratios as aligned words or as decisions.
+    static MORVIK_INLINE Outputs from(typename Raw<lanes>::Signed ratios)
+    {
+        if constexpr (sizeof(Output) == 1) {
+            // A ratio of 0 or more decides for 1 (rule 16): the sign bit is clear.
+            return __builtin_convertvector((ratios >> 15) + 1, Outputs);
+        } else {
+            // Aligned words wrap (rule 8).
+            return reinterpret_cast<Outputs>(reinterpret_cast<typename Raw<lanes>::Unsigned>(ratios)
+                                             << static_cast<int>(rules::stateAlignment));
         }
     }
-    unsigned any = 0;
-    for (unsigned i = 0; i < BestTile::lanes; ++i) {
-        any |= beyond[i];
-    }
-    return any < 256;
-}
+};
 
 /// Writes slices of ratios to arrays, one for each lane, as aligned words or as decisions.
 template <unsigned count, class Output>
 void spreadSlices(const std::int16_t* slices, unsigned steps, Output* const* arrays)
 {
     using BestTile = TileOf<count>;
-    typedef Output Outputs __attribute__((vector_size(BestTile::lanes * sizeof(Output))));
+    using Conversion = OutputsOf<Output, BestTile::lanes>;
     for (unsigned lane = 0; lane < count; lane += BestTile::lanes) {
-        for (unsigned next = 0; next < steps; next += BestTile::size) {
-            const unsigned k = next + BestTile::size <= steps ? next : steps - BestTile::size;
+        byEight(steps, [&](unsigned k) MORVIK_INLINE_LAMBDA {
             BestTile tile;
             for (unsigned i = 0; i < BestTile::size; ++i) {
                 std::memcpy(&tile[i], slices + (k + i) * count + lane, sizeof tile[i]);
             }
             tile.transpose();
             for (unsigned i = 0; i < BestTile::size; ++i) {
-                Outputs values;
-                if constexpr (sizeof(Output) == 1) {
-                    // A ratio of 0 or more decides for 1 (rule 16): the sign bit is clear.
-                    values = __builtin_convertvector((tile[i] >> 15) + 1, Outputs);
-                } else {
-                    // Aligned words wrap (rule 8).
-                    values = reinterpret_cast<Outputs>(reinterpret_cast<typename BestTile::Unsigned>(tile[i])
-                                                       << static_cast<int>(rules::stateAlignment));
-                }
+                const typename Conversion::Outputs values = Conversion::from(tile[i]);
                 for (unsigned half = 0; half < BestTile::lanes / 8; ++half) {
                     std::memcpy(arrays[lane + 8 * half + i] + k,
                                 reinterpret_cast<const Output*>(&values) + 8 * half,
                                 8 * sizeof(Output));
                 }
             }
-        }
+        });
     }
+}
+
+/// Writes slices of one ratio to an array, as above.
+template <class Output>
+void spreadSteps(const std::int16_t* slices, unsigned steps, Output* array)
+{
+    byEight(steps, [&](unsigned k) MORVIK_INLINE_LAMBDA {
+        Raw<8>::Signed ratios;
+        std::memcpy(&ratios, slices + k, sizeof ratios);
+        const typename OutputsOf<Output, 8>::Outputs values = OutputsOf<Output, 8>::from(ratios);
+        std::memcpy(array + k, &values, sizeof values);
+    });
 }
 
 }  // namespace morvik::lanes::MORVIK_LANES

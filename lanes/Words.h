@@ -47,6 +47,28 @@ struct Eighths {
         std::memcpy(__builtin_assume_aligned(to, sizeof v), &v, sizeof v);
     }
 
+    static MORVIK_INLINE Eighths loadAnywhere(const std::int16_t* from)
+    {
+        Vector v;
+        std::memcpy(&v, from, sizeof v);
+        return {v};
+    }
+
+    MORVIK_INLINE void storeAnywhere(std::int16_t* to) const
+    {
+        std::memcpy(to, &v, sizeof v);
+    }
+
+    /// Loads half a vector into both halves.
+    static MORVIK_INLINE Eighths twice(const std::int16_t* from)
+    {
+        static_assert(count == 8);
+        typedef std::int64_t Halves __attribute__((vector_size(16)));
+        std::int64_t half;
+        std::memcpy(&half, from, sizeof half);
+        return {reinterpret_cast<Vector>(Halves{half, half})};
+    }
+
     friend MORVIK_INLINE Eighths operator+(Eighths a, Eighths b)
     {
         return {a.v + b.v};
