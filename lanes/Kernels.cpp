@@ -80,8 +80,8 @@ struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
     template <template <unsigned> class RuleOf, Extrinsic extrinsic>
     static void decodeBy(const Workspace& workspace, unsigned from, unsigned to)
     {
-        decodeAbreast<RuleOf, RuleOf<count>::corrects ? correctedAbreast : plainAbreast, extrinsic>(
-            workspace, from, to);
+        constexpr unsigned abreast[] = {plainAbreast, correctedAbreast};
+        decodeAbreast<RuleOf, abreast[RuleOf<count>::corrects ? 1 : 0], extrinsic>(workspace, from, to);
     }
 
     template <template <unsigned> class RuleOf, unsigned abreast, Extrinsic extrinsic>

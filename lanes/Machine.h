@@ -5,6 +5,8 @@
 //   VectorLanes             the widths of its vectors
 //   Kernels                 the shapes of its kernels, ascending in lanes
 //   holdsTwoRecursions      whether its registers hold two recursions at once
+//   pairsStates             whether the forward recursion over `count` lanes takes two states into a vector
+//   halves<i, j>(a, b)      half i of a, and half j of b
 //   tileHalves              halves of the widest tile that it transposes efficiently (Transpose.h)
 //   Permutation<count>      gathers a vector with permuted lanes
 //   Corrections<count>      looks up the correction of a decision difference in each lane
@@ -51,8 +53,12 @@ struct Portable {
     using VectorLanes = std::integer_sequence<unsigned, 8>;
     using Kernels = Shapes<Shape<1, 1>, Shape<8, 1>, Shape<8, 2>, Shape<8, 4>>;
     static constexpr bool holdsTwoRecursions = false;
-    static constexpr unsigned pairedLanes = 0;
     static constexpr unsigned tileHalves = 1;
+
+    static constexpr bool pairsStates(unsigned, bool)
+    {
+        return false;
+    }
 
     /// The control holds the source lanes themselves.
     template <unsigned count>
@@ -253,8 +259,12 @@ MORVIK_INLINE Eighths<16> clippedFrom(int lo, int hi, Eighths<16> a)
 struct Avx2 : Ssse3 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16>;
     using Kernels = Shapes<Shape<1, 1>, Shape<8, 1, 2>, Shape<16, 1>, Shape<16, 2>>;
-    static constexpr unsigned pairedLanes = 8;
     static constexpr unsigned tileHalves = 2;
+
+    static constexpr bool pairsStates(unsigned count, bool)
+    {
+        return count == 8;
+    }
 
     template <unsigned i, unsigned j>
     static MORVIK_INLINE Eighths<16> halves(Eighths<16> a, Eighths<16> b)
@@ -306,6 +316,27 @@ struct Avx512 : Avx2 {
                            Shape<16, 1, (holdsTwoRecursions ? 1 : 2), 2>,
                            Shape<32, 1>,
                            Shape<32, 2>>;
+
+    static constexpr bool pairsStates(unsigned count, bool corrects)
+    {
+        return count == 8 || (count == 16 && !holdsTwoRecursions && !corrects);
+    }
+
+    /// Of the intrinsic for any choice, g++ warns in its own header.
+    using Avx2::halves;
+    template <unsigned i, unsigned j>
+    static MORVIK_INLINE Eighths<32> halves(Eighths<32> a, Eighths<32> b)
+    {
+        if constexpr (i == 0 && j == 1) {
+            return {(Raw<32>::Signed)_mm512_mask_blend_epi64(0xF0, (__m512i)a.v, (__m512i)b.v)};
+        } else {
+            typedef std::int64_t Quads __attribute__((vector_size(64)));
+            constexpr int m = 4 * i;
+            constexpr int n = 8 + 4 * j;
+            return {reinterpret_cast<Raw<32>::Signed>(
+                __builtin_shufflevector((Quads)a.v, (Quads)b.v, m, m + 1, m + 2, m + 3, n, n + 1, n + 2, n + 3))};
+        }
+    }
 
     /// An index word for each lane.
     template <unsigned count>

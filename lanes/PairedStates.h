@@ -13,9 +13,9 @@
 namespace morvik::lanes::MORVIK_LANES {
 
 /// A column of `count` lanes, in four vectors of two states each. A state's place, counted in halves of vectors, is its
-/// number with the three bits rotated left, once for each step since the recursion began. The encoder shifts its
-/// register in the same way, so most decisions find their candidates in place: of three steps, one swaps the halves of
-/// four vectors, and one exchanges halves between vectors.
+/// number with the three bits rotated left, once for each step since the window began. A step shifts the bits of a
+/// state by one the other way, so most decisions find their candidates in place: of three steps, one swaps the halves
+/// of four vectors, and one exchanges halves between vectors.
 template <template <unsigned> class RuleOf, unsigned count>
 class PairedStates {
     static constexpr unsigned states = rules::stateCount;
@@ -41,7 +41,7 @@ public:
         rules::forEach<pairs>([&](auto i) MORVIK_INLINE_LAMBDA { itsPairs[i] = joined(a[2 * i], a[2 * i + 1]); });
     }
 
-    /// Returns the column after `steps` steps.
+    /// Returns the column, after `steps` steps.
     MORVIK_INLINE Column column(unsigned steps) const
     {
         switch (steps % turn) {
@@ -69,9 +69,11 @@ public:
         rules::forEach<pairs>([&](auto i) MORVIK_INLINE_LAMBDA {
             constexpr unsigned x = stateAt(2 * i, steps + 1);
             constexpr unsigned y = stateAt(2 * i + 1, steps + 1);
-            const Value branches = halves<metric(x), metric(y)>(g, g);
+            constexpr unsigned oneToX = rules::predecessor(x, 1);
+            constexpr unsigned oneToY = rules::predecessor(y, 1);
+            const Value branches = halves<metric(oneToX), metric(oneToY)>(g, g);
             next[i] = rule.decide(
-                rule.add(ofStates<rules::predecessor(x, 1), rules::predecessor(y, 1), steps>(), branches),
+                rule.add(ofStates<oneToX, oneToY, steps>(), branches),
                 rule.subtract(ofStates<rules::predecessor(x, 0), rules::predecessor(y, 0), steps>(), branches));
         });
         itsPairs = next;
@@ -94,11 +96,10 @@ private:
         return place(at, turn - steps % turn);
     }
 
-    /// The half of `g` with the metric of the branches that enter a state.
+    /// The half of `g` with the metric of the branches that leave a state.
     static constexpr unsigned metric(unsigned state)
     {
-        const unsigned branch = rules::branch(rules::predecessor(state, 1));
-        return branch == 0 || branch == 3 ? 0 : 1;
+        return rules::branch(state) % 3 == 0 ? 0 : 1;
     }
 
     template <unsigned x, unsigned y, unsigned steps>

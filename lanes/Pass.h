@@ -36,7 +36,7 @@ class Pass {
     using WideColumn = rules::Column<WideDecision>;
 
     /// Whether the forward recursion has two states in a vector.
-    static constexpr bool paired = count == Machine::pairedLanes;
+    static constexpr bool paired = Machine::pairsStates(count, WideRule::corrects);
     using Paired = PairedStates<RuleOf, count>;
     using ForwardRule = RuleOf<paired ? 2 * count : count>;
 
@@ -191,7 +191,7 @@ private:
             backward<ratios>(windows, windows.length - next.length, b);
         } else {
             if constexpr (paired) {
-                backwardInPairs<ratios>(windows, b);
+                backwardOfPairs<ratios>(windows, b);
             } else {
                 backward<ratios>(windows, windows.length, b);
             }
@@ -220,17 +220,14 @@ private:
         Paired pairs(a);
         std::int16_t* slot = itsSlots + windows.slot;
         const std::ptrdiff_t direction = windows.direction;
-        std::size_t i = at(windows, j, 0);
-        const std::size_t end = i + windows.length;
-        const auto step = [&](auto steps) MORVIK_INLINE_LAMBDA {
-            if (i != end) {
-                own.template pairedStep<steps>(i, slot, j, pairs);
-                slot += direction;
-                ++i;
-            }
-        };
-        while (i != end) {
-            rules::forEach<Paired::turn>(step);
+        const std::size_t first = at(windows, j, 0);
+        for (std::size_t begin = 0; begin < windows.length; begin += Paired::turn) {
+            rules::forEach<Paired::turn>([&](auto steps) MORVIK_INLINE_LAMBDA {
+                if (begin + steps < windows.length) {
+                    own.template pairedStep<steps>(first + begin + steps, slot, j, pairs);
+                    slot += direction;
+                }
+            });
         }
         a = pairs.column(windows.length);
     }
@@ -246,27 +243,21 @@ private:
         }
     }
 
+    /// The same over all steps, after a forward recursion with two states in a vector.
     template <Ratios ratios>
-    MORVIK_INLINE void backwardInPairs(const Windows& windows, WideColumn& b) const
+    MORVIK_INLINE void backwardOfPairs(const Windows& windows, WideColumn& b) const
     {
-        std::size_t i = windows.length;
         const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
-        const auto step = [&](auto steps) MORVIK_INLINE_LAMBDA {
-            slot -= windows.direction;
-            --i;
-            backwardStep<ratios, steps>(windows, i, slot, b);
-        };
-        while (i != 0) {
-            switch (i % Paired::turn) {
-            case 0:
-                step(std::integral_constant<unsigned, 2>{});
-                [[fallthrough]];
-            case 2:
-                step(std::integral_constant<unsigned, 1>{});
-                [[fallthrough]];
-            default:
-                step(std::integral_constant<unsigned, 0>{});
-            }
+        for (std::size_t end = windows.length; end > 0;) {
+            const std::size_t begin = (end - 1) / Paired::turn * Paired::turn;
+            rules::forEach<Paired::turn>([&](auto steps) MORVIK_INLINE_LAMBDA {
+                constexpr unsigned back = Paired::turn - 1 - steps;
+                if (begin + back < end) {
+                    slot -= windows.direction;
+                    backwardStep<ratios, back>(windows, begin + back, slot, b);
+                }
+            });
+            end = begin;
         }
     }
 
