@@ -29,17 +29,17 @@ MORVIK_INLINE void forPasses(const Workspace& workspace, unsigned from, unsigned
     }
 }
 
-/// Decodes by Kernel::decodeBy<rule, extrinsic>.
-template <class Kernel>
-void decodeBy(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to)
+/// Decodes by Decoder::decodeBy<rule, extrinsic>.
+template <class Decoder>
+void decodeByAlgorithm(const Workspace& workspace, Algorithm algorithm, unsigned from, unsigned to)
 {
     switch (algorithm) {
     case Algorithm::greatest:
-        return Kernel::template decodeBy<Greatest, Extrinsic::whole>(workspace, from, to);
+        return Decoder::template decodeBy<Greatest, Extrinsic::whole>(workspace, from, to);
     case Algorithm::greatestScaled:
-        return Kernel::template decodeBy<Greatest, Extrinsic::scaled>(workspace, from, to);
+        return Decoder::template decodeBy<Greatest, Extrinsic::scaled>(workspace, from, to);
     case Algorithm::corrected:
-        return Kernel::template decodeBy<Corrected, Extrinsic::whole>(workspace, from, to);
+        return Decoder::template decodeBy<Corrected, Extrinsic::whole>(workspace, from, to);
     }
 }
 
@@ -74,7 +74,7 @@ struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
         if (from == 0) {
             interleave(workspace);
         }
-        lanes::MORVIK_LANES::decodeBy<KernelOf>(workspace, algorithm, from, to);
+        decodeByAlgorithm<KernelOf>(workspace, algorithm, from, to);
     }
 
     template <template <unsigned> class RuleOf, Extrinsic extrinsic>
@@ -184,7 +184,7 @@ struct KernelOf<Shape<1, 1>> {
                 interleaved.systematic[i] = workspace.constituent[0].systematic[interleaved.interleaver.sources[i]];
             }
         }
-        lanes::MORVIK_LANES::decodeBy<KernelOf>(workspace, algorithm, from, to);
+        decodeByAlgorithm<KernelOf>(workspace, algorithm, from, to);
     }
 
     template <template <unsigned> class RuleOf, Extrinsic extrinsic>

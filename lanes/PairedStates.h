@@ -61,7 +61,7 @@ public:
             [&](auto i) MORVIK_INLINE_LAMBDA { Decision::stored(itsPairs[i]).store(metrics + 2 * i * count); });
     }
 
-    /// Takes the step after `steps` others. `g` holds the branch metrics 0 and 1; 3 and 2 repeat them.
+    /// Takes the step after `steps` others. `g` holds the branch metrics 0 and 1; 3 repeats 0, and 2 repeats 1.
     template <unsigned steps>
     MORVIK_INLINE void step(const Decision& rule, Value g)
     {
