@@ -361,7 +361,7 @@ def flow():
                           ("A slice for each step, a lane for each segment", "lanes/LaneDecoder.cpp: load, prepareWork", "lanes/SizeTables.cpp: write",
                            "lanes/Transpose.h: fillSlices"),
                           ("The kernel of an instruction set", "lanes/LaneDecoder.cpp: decode, prepareStarts",
-                           "lanes/Kernels.cpp: decode, forPasses"),
+                           "lanes/Kernels.cpp: decode, forHalfIterations"),
                           ("A pass, window by window", "lanes/Pass.h: runPass, forwardStep, backwardStep", "lanes/StatePass.h: run",
                            "lanes/Rules.h: Greatest, Corrected", "lanes/Machine.h: Permutation"),
                           ("Decisions", "src/LanePath.cpp: decisions, ratios", "lanes/LaneDecoder.cpp: spread"))

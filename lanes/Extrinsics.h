@@ -13,9 +13,6 @@ namespace morvik::lanes::MORVIK_LANES {
 /// Whether extrinsic values are passed on unscaled, or times the scale of rules/Algorithms.h (rule 14).
 enum class Extrinsic { whole, scaled };
 
-/// Whether a pass keeps its ratios, as the last one does.
-enum class Ratios { dropped, kept };
-
 /// LTE has no second parity stream (rule 5), so the last two branch metrics repeat the others: 2 is 1, and 3 is 0.
 template <unsigned count>
 MORVIK_INLINE BranchMetrics<count> branchMetrics(Eighths<count> joint, Eighths<count> parity)

@@ -12,20 +12,15 @@
 namespace morvik::lanes::MORVIK_LANES {
 namespace {
 
-/// Calls run(ratios, d, joint, isFirst) for passes. Even ones belong to decoder 1, odd ones to decoder 0 (rule 15).
-/// Pass 0 has no a-priori values.
+/// Calls run(half) for half-iterations. Even ones belong to decoder 1, odd ones to decoder 0 (rule 15). The first one
+/// has no a-priori values.
 template <class Run>
-MORVIK_INLINE void forPasses(const Workspace& workspace, unsigned from, unsigned to, Run run)
+void forHalfIterations(const Workspace& workspace, unsigned from, unsigned to, Run run)
 {
     for (unsigned h = from; h < to; ++h) {
         const unsigned d = rules::constituentOf(h);
         const Constituent& other = workspace.constituent[1 - d];
-        const std::int16_t* joint = h == 0 ? other.systematic : other.joint;
-        if (h + 1 < to) {
-            run(std::integral_constant<Ratios, Ratios::dropped>{}, d, joint, rules::isFirstPass(h));
-        } else {
-            run(std::integral_constant<Ratios, Ratios::kept>{}, d, joint, rules::isFirstPass(h));
-        }
+        run(HalfIteration{d, h == 0 ? other.systematic : other.joint, rules::isFirstPass(h), h + 1 == to});
     }
 }
 
@@ -92,8 +87,8 @@ struct KernelOf<Shape<count, vectors, plainAbreast, correctedAbreast>> {
                 return decodeAbreast<RuleOf, abreast / 2, extrinsic>(workspace, from, to);
             }
         }
-        forPasses(workspace, from, to, [&](auto ratios, unsigned d, const std::int16_t* joint, bool isFirst) {
-            runPass<RuleOf, count, vectors, abreast, extrinsic, ratios>(workspace, d, joint, isFirst);
+        forHalfIterations(workspace, from, to, [&](const HalfIteration& half) {
+            runPass<RuleOf, count, vectors, abreast, extrinsic>(workspace, half);
         });
     }
 
@@ -190,9 +185,8 @@ struct KernelOf<Shape<1, 1>> {
     template <template <unsigned> class RuleOf, Extrinsic extrinsic>
     static void decodeBy(const Workspace& workspace, unsigned from, unsigned to)
     {
-        forPasses(workspace, from, to, [&](auto ratios, unsigned d, const std::int16_t* joint, bool) {
-            runPass<RuleOf, extrinsic, ratios>(workspace, d, joint);
-        });
+        forHalfIterations(
+            workspace, from, to, [&](const HalfIteration& half) { runPass<RuleOf, extrinsic>(workspace, half); });
     }
 
     static constexpr Kernel kernel = {1,

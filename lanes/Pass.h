@@ -52,24 +52,23 @@ public:
     static constexpr unsigned slotBytes = 2 * slotWords;
     static constexpr unsigned forwardBytes = vectors * static_cast<unsigned>(sizeof(Column));
 
-    MORVIK_INLINE Pass(const Workspace& workspace, unsigned d, const std::int16_t* joint)
+    MORVIK_INLINE Pass(const Workspace& workspace, const HalfIteration& half)
         : w(workspace),
-          itsConstituent(workspace.constituent[d]),
+          itsConstituent(workspace.constituent[half.d]),
           itsSteps(w.steps),
-          itsSource(joint),
+          itsSource(half.joint),
           itsInterleaver(itsConstituent.interleaver),
           itsParity(itsConstituent.parity),
           itsSystematic(itsConstituent.systematic),
           itsJoint(itsConstituent.joint),
-          itsRatios(w.ratios),
+          itsRatios(half.isLast ? w.ratios : nullptr),
           itsSlots(w.slots),
           itsRule(workspace.corrections),
           itsWideRule(workspace.corrections)
     {
     }
 
-    /// `isFirst`: whether this is the decoder's first pass over the block.
-    template <Ratios ratios>
+    /// `isFirst` is that of the half-iteration.
     MORVIK_INLINE void run(bool isFirst) const
     {
         // The last window starts from the column that the next segment's first window reached: in this pass if there is
@@ -87,7 +86,7 @@ public:
         runForward(windows);
         while (windows.length != 0) {
             const Windows next = following(windows);
-            runWindows<ratios>(windows, next);
+            runWindows(windows, next);
             if (handedWithin && windows.r[0] == 0 && next.r[0] != 0) {
                 handBack();
             }
@@ -180,20 +179,19 @@ private:
 
     /// Runs the backward recursion of windows, together with the forward recursion of the next one if registers
     /// suffice for both: two independent dependency chains keep the execution units busy.
-    template <Ratios ratios>
     MORVIK_INLINE void runWindows(const Windows& windows, const Windows& next) const
     {
         WideColumn b = startColumn(windows);
         if constexpr (overlapped) {
             if (next.length != 0) {
-                runForward(next, [&](Column& a) MORVIK_INLINE_LAMBDA { both<ratios>(windows, b, next, a); });
+                runForward(next, [&](Column& a) MORVIK_INLINE_LAMBDA { both(windows, b, next, a); });
             }
-            backward<ratios>(windows, windows.length - next.length, b);
+            backward(windows, windows.length - next.length, b);
         } else {
             if constexpr (paired) {
-                backwardOfPairs<ratios>(windows, b);
+                backwardOfPairs(windows, b);
             } else {
-                backward<ratios>(windows, windows.length, b);
+                backward(windows, windows.length, b);
             }
             if (next.length != 0) {
                 runForward(next);
@@ -233,18 +231,16 @@ private:
     }
 
     /// Runs the backward recursion over the first `steps` steps of the windows.
-    template <Ratios ratios>
     MORVIK_INLINE void backward(const Windows& windows, unsigned steps, WideColumn& b) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(steps);
         for (std::size_t i = steps; i-- > 0;) {
             slot -= windows.direction;
-            backwardStep<ratios>(windows, i, slot, b);
+            backwardStep(windows, i, slot, b);
         }
     }
 
     /// The same over all steps, after a forward recursion with two states in a vector.
-    template <Ratios ratios>
     MORVIK_INLINE void backwardOfPairs(const Windows& windows, WideColumn& b) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
@@ -254,7 +250,7 @@ private:
                 constexpr unsigned back = Paired::turn - 1 - steps;
                 if (begin + back < end) {
                     slot -= windows.direction;
-                    backwardStep<ratios, back>(windows, begin + back, slot, b);
+                    backwardStep<back>(windows, begin + back, slot, b);
                 }
             });
             end = begin;
@@ -262,14 +258,13 @@ private:
     }
 
     /// Runs all forward steps of the next window, which is not longer, and as many backward steps of the windows.
-    template <Ratios ratios>
     MORVIK_INLINE void both(const Windows& windows, WideColumn& b, const Windows& next, Column& a) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
         std::int16_t* nextSlot = itsSlots + next.slot;
         for (std::size_t i = 0; i < next.length; ++i) {
             slot -= windows.direction;
-            backwardStep<ratios>(windows, windows.length - 1 - i, slot, b);
+            backwardStep(windows, windows.length - 1 - i, slot, b);
             forwardStep(at(next, 0, i), nextSlot, a);
             nextSlot += next.direction;
         }
@@ -339,7 +334,7 @@ private:
         return joined<0, abreast>([&](unsigned j) MORVIK_INLINE_LAMBDA { return Value::load(first + j * distance); });
     }
 
-    template <Ratios ratios, unsigned steps = 0>
+    template <unsigned steps = 0>
     MORVIK_INLINE void backwardStep(const Windows& windows,
                                     std::size_t i,
                                     const std::int16_t* words,
@@ -349,7 +344,7 @@ private:
         const WideValue g0 = slot.branch(0);
         const WideValue g1 = slot.branch(1);
         const WideValue ratio = itsWideRule.stepBack(slot, b, {g0, g1, g1, g0});
-        if constexpr (ratios == Ratios::kept) {
+        if (itsRatios != nullptr) {
             storeValues(windows, i, ratio, itsRatios);
         }
         const WideValue joint = WideValue::load(words + slotJoint);
@@ -489,21 +484,16 @@ private:
     const std::int16_t* const itsParity;
     const std::int16_t* const itsSystematic;
     std::int16_t* const itsJoint;
-    std::int16_t* const itsRatios;
+    std::int16_t* const itsRatios;  ///< null if they are dropped
     std::int16_t* const itsSlots;
     const ForwardRule itsRule;
     const WideRule itsWideRule;
 };
 
-template <template <unsigned> class RuleOf,
-          unsigned count,
-          unsigned vectors,
-          unsigned abreast,
-          Extrinsic extrinsic,
-          Ratios ratios>
-MORVIK_INLINE_CALLS void runPass(const Workspace& workspace, unsigned d, const std::int16_t* joint, bool isFirst)
+template <template <unsigned> class RuleOf, unsigned count, unsigned vectors, unsigned abreast, Extrinsic extrinsic>
+MORVIK_INLINE_CALLS void runPass(const Workspace& workspace, const HalfIteration& half)
 {
-    Pass<RuleOf, count, vectors, abreast, extrinsic>(workspace, d, joint).template run<ratios>(isFirst);
+    Pass<RuleOf, count, vectors, abreast, extrinsic>(workspace, half).run(half.isFirst);
 }
 
 }  // namespace morvik::lanes::MORVIK_LANES

@@ -40,10 +40,11 @@ public:
     /// Memory needed in the workspace for a step of a window.
     static constexpr unsigned slotBytes = 2 * slotsWords / longestWindow;
 
-    MORVIK_INLINE StatePass(const Workspace& workspace, unsigned d, const std::int16_t* joint)
+    MORVIK_INLINE StatePass(const Workspace& workspace, const HalfIteration& half)
         : w(workspace),
-          itsConstituent(workspace.constituent[d]),
-          itsSource(joint),
+          itsConstituent(workspace.constituent[half.d]),
+          itsSource(half.joint),
+          itsRatios(half.isLast ? w.ratios : nullptr),
           itsBefore(w.slots),
           itsAfter(w.slots + slotsAfter),
           itsBranches(w.slots + slotsBranches),
@@ -52,7 +53,6 @@ public:
     {
     }
 
-    template <Ratios ratios>
     MORVIK_INLINE void run() const
     {
         Metric a = Decision::metric(Value::load(itsConstituent.alphaStart));
@@ -68,7 +68,7 @@ public:
             if (r > 0) {
                 (Decision::stored(broughtBack(b)) & Value::of(borderMask)).store(start - states);
             }
-            results<ratios>(from, length);
+            results(from, length);
         }
     }
 
@@ -132,15 +132,14 @@ private:
                            rule.subtract(permuted<rules::successor(state, 0)...>(b), left));
     }
 
-    template <Ratios ratios>
     MORVIK_INLINE void results(unsigned from, unsigned length) const
     {
         const Decision rule = itsRule.decision();
         byEight(length, [&](unsigned k) MORVIK_INLINE_LAMBDA {
             const Value ratio = rules::logLikelihoodRatio(
                 rule, columns(itsBefore + k * states), columns(itsAfter + k * states), branchesOf(from, k));
-            if constexpr (ratios == Ratios::kept) {
-                ratio.storeAnywhere(w.ratios + from + k);
+            if (itsRatios != nullptr) {
+                ratio.storeAnywhere(itsRatios + from + k);
             }
             nextJoint<extrinsic>(
                 ratio, Value::loadAnywhere(itsSlotJoint + k), Value::loadAnywhere(itsConstituent.systematic + from + k))
@@ -183,6 +182,7 @@ private:
     const Workspace& w;
     const Constituent& itsConstituent;
     const std::int16_t* const itsSource;  ///< joint values of the other decoder
+    std::int16_t* const itsRatios;        ///< null if they are dropped
     std::int16_t* const itsBefore;
     std::int16_t* const itsAfter;
     std::int16_t* const itsBranches;
@@ -190,10 +190,10 @@ private:
     const Rule itsRule;
 };
 
-template <template <unsigned> class RuleOf, Extrinsic extrinsic, Ratios ratios>
-MORVIK_INLINE_CALLS void runPass(const Workspace& workspace, unsigned d, const std::int16_t* joint)
+template <template <unsigned> class RuleOf, Extrinsic extrinsic>
+MORVIK_INLINE_CALLS void runPass(const Workspace& workspace, const HalfIteration& half)
 {
-    StatePass<RuleOf, extrinsic>(workspace, d, joint).template run<ratios>();
+    StatePass<RuleOf, extrinsic>(workspace, half).run();
 }
 
 }  // namespace morvik::lanes::MORVIK_LANES

@@ -50,6 +50,14 @@ struct Workspace {
     std::int16_t* ratios;             ///< [vector][step][lane] log-likelihood ratios of the last pass
 };
 
+/// A pass of a decode.
+struct HalfIteration {
+    unsigned d;                 ///< the constituent decoder
+    const std::int16_t* joint;  ///< [vector][step][lane] what the other decoder passes on
+    bool isFirst;               ///< whether it is the decoder's first pass over the block
+    bool isLast;                ///< whether its ratios are kept
+};
+
 }  // namespace morvik::lanes
 
 #endif

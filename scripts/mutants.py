@@ -210,8 +210,6 @@ EQUIVALENT = {
           ("+= abreast * length", "+= abreast + length"), ("+= abreast * length", "-= abreast * length")]),
         ("one vector more, into spare room",
          [("= 0; at <", "= 0; at <=")]),
-        ("later passes overwrite the ratios",
-         [("(h + 1 <", "(h + 2 <"), ("+ 1 < to)", "+ 1 < from)")]),
         ("the forward recursion runs one window at a time",
          [("vectors, 1,", "vectors, 2,")]),
     ],
