@@ -132,11 +132,13 @@ stage_memory() {
 stage_memory-short() {
     local long=(BerRuns Faults/FaultyCore Stages/Mistakes Coverage.IsWholeInASet SelfCheck.FindsTheLibraryRight
         SelfCheck.Notices{TheLast,Another,Other} VcdDump.RefusesTimesAndChangesWithoutAnEnd
-        Vectors.{ChecksCasesOfUnits,WritesWhatDecodeReads} Sizes/ModelValues.FollowFromEachOther/{6,7}
+        Vectors.{ChecksCasesOfUnits,WritesWhatDecodeReads} Sizes/ModelValues.FollowFromEachOther/{5,6,7}
         Trace.NeedsNoMore DefaultScale.HalfAnd Situations.AreCountedAs FrameSource.DrawsWhat VectorSet.IsAsTheModelDecodesWithAll
-        BerLink.GoesOnUntil Compare.{AgreesWithTheTrace,TellsThatADump,TellsWhichCore} CodeBlocksTest.AgreesWithTheClause)
-    long+=(Diagnosis.{BlamesNoiseAlone,TakesNoChance,Finds{EachMistake,PairsOf,NothingIn,TheTails,AMissingOr,AScaleBeside}}
-        ChainDiagnosis.{BlamesNoiseAlone,TakesNoChance,NamesNoMistakeThat,TellsWhenBits}
+        BerLink.GoesOnUntil Compare.{AgreesWithTheTrace,FindsNoDifferenceInTheCore,TellsThatADump,TellsWhichCore}
+        CodeBlocksTest.AgreesWithTheClause SoftValueSampler.{CountsClipped,ValuesHave} UnitStimulus.{HasValues,IsTheSame}
+        VectorSet.HasTheCodeBlocks)
+    long+=(Diagnosis.{BlamesNoiseAlone,TakesNoChance,Finds{EachMistake,PairsOf,NothingIn,TheTails,TheSizeOf,AMissingOr,AScaleBeside}}
+        ChainDiagnosis.{BlamesNoiseAlone,DoesNotBlame,TakesNo{Chance,Zeros},NamesNoMistakeThat,TellsWhenBits}
         ChainDiagnosis.Finds{EachMistake,PairsOf,NothingIn,TheSoftBuffer,MistakesBy,Scales})
     local scripts=(example_set example_sweep core_from_document default_core regression report_in_browser same_results same_vectors
         waveforms)
