@@ -69,7 +69,7 @@ PLACES = {
 }
 
 # Functions that choose how something is computed, never what: there, mistakes cost time alone.
-SPEED_ALONE = {"lanes/Kernels.cpp": ["stepsRun"]}
+SPEED_ALONE = {"lanes/Kernels.cpp": ["stepsRun"], "lanes/Machine.h": ["pairsStates"]}
 
 # Replacements: operators with a space on both sides or at the end of their line, and words.
 SWAPS = [("+", "-"), ("-", "+"), ("<", "<="), ("<=", "<"), (">", ">="), (">=", ">"), ("==", "!="), ("!=", "=="),
@@ -166,6 +166,44 @@ EQUIVALENT = {
          [("tileHalves = 2;", "tileHalves = 1;"), ("== 8;  //", "== 9;  //"), ("== 8;  //", "== 7;  //"),
           ("== 8;  //", "!= 8;  //")]),
         ("a value more, of the tail, which is dropped", [("copies[8]", "copies[9]")]),
+        ("the last two entries of the table are 0", [
+            ("int drops = correctionEntries - 1", "int drops = correctionEntries - 2"), ("reach - 1)", "reach - 2)"),
+            ("reach - 1, difference)", "reach - 2, difference)")]),
+        ("beyond either end of the table stands its last entry, up to a step away", [
+            ("reach - 1)", "reach - 0)"), ("reach - 1)", "reach + 1)"), ("reach - 1, difference)", "reach - 0, difference)"),
+            ("reach - 1, difference)", "reach + 1, difference)")]),
+        ("the general form of the same instruction", [("i == 0 && j == 1", "i == 0 && j == 2")]),
+    ],
+    "link/coding/CodeBlocks.cpp": [
+        ("the size of no block", [("count, 0, plus->K", "count, 1, plus->K")]),
+    ],
+    "link/coding/Crc.cpp": [
+        ("the remainder of a byte of zeros is 0", [("byte = 0;", "byte = 1;")]),
+    ],
+    "link/coding/PackedBits.cpp": [
+        ("copies the same bits in other parts", [
+            ("% 64 != 0 && count > 0", "% 64 != 0 && count > 1"), ("% 64 != 0 && count > 0", "% 64 != 0 || count > 0")]),
+        ("the rest is packed bit by bit", [("count / 8 * 8", "count / 9 * 8"), ("count / 8 * 8", "count / 8 * 7")]),
+    ],
+    "link/coding/PackedBits.h": [
+        ("set later", [("words = 0;", "words = 1;")]),
+    ],
+    "link/coding/TransportBlock.cpp": [
+        ("a word in front of each row that nobody reads", [("itsWordOffsets.push_back(0)", "itsWordOffsets.push_back(1)")]),
+        ("adds 0", [("r > shorter ?", "r >= shorter ?")]),
+        ("there is no code block of that kind", [("kind < itsKinds.size()", "kind <= itsKinds.size()")]),
+        ("code blocks are encoded one by one", [("== TurboEncoder::blocksAtOnce", "!= TurboEncoder::blocksAtOnce")]),
+        ("copies no bit", [("first < bits", "first <= bits"), ("end > itsBlocks.bits", "end >= itsBlocks.bits")]),
+        ("every word is written over", [("coded.words, 0)", "coded.words, 1)")]),
+    ],
+    "link/modulation/Demapper.cpp": [
+        ("written over", [("bits = 0;", "bits = 1;"), ("largest = 0;", "largest = 1;")]),
+        ("of numbers that are all 0, the next larger one", [("most = 0;", "most = 1;")]),
+        ("a bound with room", [
+            ("4096 *", "4097 *"), ("4096 *", "4095 *"), ("gain + 1)", "gain + 2)"), ("gain * gain + gain +", "gain * gain - gain +"),
+            ("gain) < most", "gain) <= most"), ("nullptr ? 1 : largestOf", "nullptr ? 2 : largestOf")]),
+        ("levels are odd, their number is even", [
+            ("level < levels", "level <= levels"), ("rest < 0", "rest < 1"), ("rest < 0", "rest <= 0")]),
     ],
     "link/coding/RateMatching.cpp": [
         ("an array with more elements", [("3 * mostPositions>", "4 * mostPositions>")]),
@@ -181,6 +219,10 @@ EQUIVALENT = {
     ],
     "link/coding/TurboEncoder.cpp": [
         ("the interleaver with an element more", [("unsigned i = 0; i < K", "unsigned i = 0; i <= K")]),
+        ("K + 4 is 4 more than a multiple of 8", [("Positions + 63)", "Positions + 64)"), ("Positions + 63)", "Positions + 62)")]),
+        ("room for more bits than there are", [("size_t{64} * itsWords", "size_t{65} * itsWords")]),
+        ("the streams have the same size", [("streams[0].bits.size()", "streams[1].bits.size()")]),
+        ("bits behind the end of a row", [("matrix.end(), 0)", "matrix.end(), 1)")]),
     ],
     "rules/Interleaver.h": [
         ("no address but the first is 0, and no difference is",
@@ -214,6 +256,9 @@ EQUIVALENT = {
          [("= 0; at <", "= 0; at <=")]),
         ("the forward recursion runs one window at a time",
          [("vectors, 1,", "vectors, 2,")]),
+        ("the speed alone", [
+            ("RuleOf<count>::corrects ? 1 : 0", "RuleOf<count>::corrects ? 1 : 1"),
+            ("RuleOf<count>::corrects ? 1 : 0", "RuleOf<count>::corrects ? 0 : 0"), ("abreast > 1)", "abreast > 2)")]),
     ],
     "lanes/LaneDecoder.cpp": [
         ("spare room between the arrays",
@@ -230,12 +275,33 @@ EQUIVALENT = {
          [("std::fill_n(alpha, states * lanes, std::int16_t{0});", "std::fill_n(alpha, states * lanes, std::int16_t{1});"),
           ("std::fill_n(alpha, states *", "std::fill_n(alpha, states +"), ("+ states *", "+ states +")]),
     ],
+    "lanes/StatePass.h": [
+        ("either tile has eight vectors", [("Tile<1>::size", "Tile<2>::size")]),
+        ("more room than is used", [
+            ("longestWindow * 4", "longestWindow * 5"), ("slotBytes = 2 *", "slotBytes = 3 *"),
+            ("slotsWords / longestWindow", "slotsWords * longestWindow")]),
+        ("g[2] is g[1]", [("lanesOf(g[0], g[1]", "lanesOf(g[0], g[2]")]),
+        ("every bit that is not 0 is bit 1", [
+            ("predecessor(state, 1)...>", "predecessor(state, 2)...>"), ("successor(state, 1)...>", "successor(state, 2)...>")]),
+    ],
+    "lanes/PairedStates.h": [
+        ("every bit that is not 0 is bit 1", [("predecessor(x, 1)", "predecessor(x, 2)"), ("predecessor(y, 1)", "predecessor(y, 2)")]),
+    ],
+    "lanes/Rules.h": [
+        ("an array with an element more", [("half[2]", "half[3]")]),
+        ("of pairs 1 and 3, which half", [
+            ("half[pair / 2] = rule", "half[pair / 3] = rule"), ("decide(half[pair / 2]", "decide(half[pair / 3]")]),
+    ],
     "lanes/Layout.h": [
         ("spare room between the arrays",
          [("line - 1)", "line - 2)"), ("line - 1)", "line - 0)"), ("+ line -", "- line -"), ("+ line -", "+ line +"),
           ("5 * line;", "6 * line;"), ("5 * line;", "4 * line;")]),
         ("std::align only checks this size",
          [("line, 1, base,", "line, 2, base,"), ("line, 1, base,", "line, 0, base,")]),
+        ("no array lies in the stagger behind the last one", [
+            ("storage.size() < measured.itsSize + line", "storage.size() < measured.itsSize - line"),
+            ("storage.size() < measured.itsSize + line", "storage.size() <= measured.itsSize + line"),
+            ("Storage(measured.itsSize + line)", "Storage(measured.itsSize - line)")]),
     ],
     "lanes/SizeTables.cpp": [
         ("spare room between the arrays",
@@ -263,6 +329,11 @@ EQUIVALENT = {
         ("a column more, into room that is written later",
          [("for (unsigned v = 0; v < vectors; ++v) {", "for (unsigned v = 0; v <= vectors; ++v) {")]),
         ("metrics stay in bounds around any state", [("stored(m[0])", "stored(m[1])")]),
+        ("the place of the joint values of a slot: room, and the speed", [
+            ("paired && abreast == 1 ?", "paired && abreast == 2 ?"), ("paired && abreast == 1 ?", "paired && abreast == 0 ?"),
+            ("paired && abreast == 1 ?", "paired && abreast != 1 ?"), ("paired && abreast == 1 ?", "paired || abreast == 1 ?"),
+            ("? 2 * wide : wide", "? 3 * wide : wide"), ("? 2 * wide : wide", "? 1 * wide : wide")]),
+        ("g[2] is g[1]", [("join(sums[0], sums[1])", "join(sums[0], sums[2])")]),
     ],
     "lanes/Transpose.h": [
         ("the last eight steps either way",
@@ -275,6 +346,7 @@ EQUIVALENT = {
          [("8; ++half)", "7; ++half)")]),
         ("a row more, which is written again, or spare room",
          [("for (unsigned i = 0; i < BestTile::size; ++i) {", "for (unsigned i = 0; i <= BestTile::size; ++i) {")]),
+        ("the last eight steps may overlap those before them", [("next += 8", "next += 7"), ("next + 8 <=", "next + 9 <=")]),
     ],
     "lanes/Words.h": [
         ("of equal values",
@@ -321,7 +393,7 @@ def code(line):
 def mutations(line):
     """Places and replacements: start, end, new text."""
     text = code(line)
-    if text.lstrip().startswith(("#", "template", "using", "static_assert")):
+    if text.lstrip().startswith(("#", "template")):
         return
     for match in re.finditer(r"(?<![\w.])\d+(?=[UL]*\b)(?![\w]*\.)", text):
         value = int(match.group())
@@ -329,8 +401,9 @@ def mutations(line):
         if value > 0:
             yield match.start(), match.end(), str(value - 1)
     for match in re.finditer(r"\b\d+\.\d+", text):
-        for factor in (0.5, 2):
-            yield match.start(), match.end(), repr(float(match.group()) * factor)
+        value = float(match.group())
+        for new in (0.5 * value, 2 * value) if value != 0 else (1.0,):
+            yield match.start(), match.end(), repr(new)
     for match in re.finditer(r"0x[0-9A-F]+", text):
         yield match.start(), match.end(), hex(int(match.group(), 16) ^ 0x80)
     for old, new in SWAPS:
@@ -357,13 +430,23 @@ def all_mutants():
     return mutants
 
 
+def declaration_lines(lines):
+    """The lines of aliases, which say which kernels there are, and of assertions, from the first to that with the semicolon."""
+    found = set()
+    for start, line in enumerate(lines):
+        if line.lstrip().startswith(("using ", "static_assert")):
+            end = next(i for i in range(start, len(lines)) if lines[i].rstrip().endswith(";"))
+            found.update(range(start, end + 1))
+    return found
+
+
 def mutants_of_places():
     for name, functions in PLACES.items():
         text = (ROOT / name).read_text()
         lines = text.split("\n")
         numbers = range(len(lines)) if functions is None else sorted(
             set().union(*(function_lines(text, function) for function in functions)))
-        skipped = set().union(*(function_lines(text, function) for function in SPEED_ALONE.get(name, [])))
+        skipped = declaration_lines(lines).union(*(function_lines(text, function) for function in SPEED_ALONE.get(name, [])))
         for number in sorted(set(numbers) - skipped):
             for start, end, new in mutations(lines[number]):
                 yield Mutant(name, number, lines[number], lines[number][:start] + new + lines[number][end:])

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <stdexcept>
+#include <tuple>
 
 #include "link/coding/SoftValues.h"
 #include "morvik_v1_0_batch.h"
@@ -135,7 +136,7 @@ TEST(TransportBlockTest, AgreesWithAnotherEncoder)
 TEST(TransportBlockTest, AgreesWithTheClauses)
 {
     Random random(1);
-    for (unsigned i = 0; i < 60; ++i) {
+    for (unsigned i = 0; i < 24; ++i) {
         TransportBlockCode code(randomFormat(random, i < 50 ? 3000 : 30000));
         std::vector<Bytes> blocks;
         for (unsigned b = 0; b < 1 + i % 3; ++b) {
@@ -182,6 +183,47 @@ TEST(TransportBlockTest, AddsReceivedValuesWhereTheirBitsCameFrom)
             ASSERT_EQ(streams, expected[r]) << code.format().bits << ' ' << r;
         }
     }
+}
+
+TEST(TransportBlockTest, PlacesValuesOfBitsThatAreSentOnce)
+{
+    Random random(5);
+    std::array<unsigned, 2> seen{};
+    for (unsigned i = 0; i < 24; ++i) {
+        TransportFormat format = randomFormat(random, 14000);
+        format.softBufferSize = morvik::link::unlimitedBuffer;
+        if (i % 3 == 0) {  // every bit once, if there is one code block
+            format.codedBits = static_cast<unsigned>(TransportBlockCode(format).softSize());
+            format.bitsPerSymbol = 1;
+            format.layers = 1;
+        }
+        const TransportBlockCode code(format);
+        auto places = morvik::plain::codedPlaces(plainFormat(format), 2);
+        const auto key = [](const auto& place) {
+            return std::tuple(place.r, place.stream, place.k);
+        };
+        std::sort(places.begin(), places.end(), [&](const auto& a, const auto& b) { return key(a) < key(b); });
+        const bool once = std::adjacent_find(places.begin(), places.end(), [&](const auto& a, const auto& b) {
+                              return key(a) == key(b);
+                          }) == places.end();
+        ASSERT_EQ(code.sendsOnce(), once) << format.bits << ' ' << format.codedBits;
+        ++seen[once];
+        if (!once) {
+            continue;
+        }
+        std::vector<std::int8_t> received(format.codedBits);
+        for (std::int8_t& value : received) {
+            value = static_cast<std::int8_t>(between(random, -128, 127));
+        }
+        const std::vector<float> numbers(received.begin(), received.end());
+        std::vector<float> sums(code.softSize());
+        code.recover(numbers.data(), 2, sums.data());
+        std::vector<std::int8_t> placed(code.softSize(), 77);
+        code.place(received.data(), 2, placed.data());
+        ASSERT_EQ(std::vector<float>(placed.begin(), placed.end()), sums) << format.bits << ' ' << format.codedBits;
+    }
+    EXPECT_GT(seen[0], 4U);
+    EXPECT_GT(seen[1], 4U);
 }
 
 TEST(TransportBlockTest, IsUnderstoodByTheDecoder)
@@ -254,7 +296,16 @@ TEST(TransportBlockTest, RefusesFormatsThatCannotBeSent)
     EXPECT_THROW(TransportBlockCode({100, 301, 2}), std::invalid_argument);
     EXPECT_THROW(TransportBlockCode({100, 302, 2, 2}), std::invalid_argument);
     EXPECT_THROW(TransportBlockCode({100, 0, 2}), std::invalid_argument);
-    EXPECT_THROW(TransportBlockCode({10000, 8, 8}), std::invalid_argument);
+    EXPECT_THROW(TransportBlockCode({100, 300, 0}), std::invalid_argument);
+    EXPECT_THROW(TransportBlockCode({100, 300, 2, 0}), std::invalid_argument);
+    EXPECT_THROW(TransportBlockCode({100, 450, 9}), std::invalid_argument);
+    EXPECT_THROW(TransportBlockCode({100, 500, 2, 5}), std::invalid_argument);
+    try {
+        const TransportBlockCode code({10000, 8, 8});
+        FAIL();
+    } catch (const std::invalid_argument& refusal) {
+        EXPECT_STREQ(refusal.what(), "coded bits are at least 16, a symbol for each code block, not 8");
+    }
     EXPECT_NO_THROW(TransportBlockCode({10000, 16, 8}));
     EXPECT_THROW(TransportBlockCode({10000, 16, 8, 1, 2}), std::invalid_argument);
 }

@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
 #include <cmath>
 #include <cstring>
@@ -154,8 +155,8 @@ TEST(DemapperTest, KeepsRatiosInTheRangeOfAFloat)
     for (const Modulation modulation : morvik::link::modulations) {
         const unsigned bits = bitsPerSymbol(modulation);
         for (const float number : numbers) {
-            for (const float gain : {0.0F, 1e-38F, 1.0F, 1e19F, most}) {
-                for (const float N0 : {least, 1e-38F, 1.0F, most}) {
+            for (const float gain : {0.0F, 1e-38F, 1.0F, 1e10F, 1e19F, 1e25F, most}) {
+                for (const float N0 : {least, 1e-38F, 1e-20F, 1.0F, 1e30F, most}) {
                     const std::array<float, 4> symbols = {number, -number / 3, 0.1F, 0.2F};
                     const std::array<float, 2> gains = {gain, 1};
                     for (const Demapper demapper : morvik::link::demappers) {
@@ -195,11 +196,31 @@ TEST(DemapperTest, OneSymbolOutOfRangeLeavesTheOthersAsTheyAre)
             demapAnySymbols(modulation, demapper, received.symbols.data(), gains, 0.1F, 30, among.data());
             EXPECT_EQ(among, alone);
             received.symbols.back() = -3e38F;
+            std::fill(among.begin(), among.end(), 0.0F);
             demapAnySymbols(modulation, demapper, received.symbols.data(), gains, 0.1F, 30, among.data());
             alone.resize(std::size_t{29} * bits);
             EXPECT_GT(std::fabs(among.back() + among[among.size() - 2]), 1e30F);
             among.resize(alone.size());
             EXPECT_EQ(among, alone);
+        }
+    }
+}
+
+TEST(DemapperTest, NoGainsAreGainsOfOne)
+{
+    morvik::blocks::Random random(5);
+    for (const Modulation modulation : morvik::link::modulations) {
+        Received received = randomSymbols(random, modulation, 30);
+        const std::vector<float> ones(30, 1);
+        for (const float last : {0.5F, -3e38F}) {
+            received.symbols.back() = last;
+            for (const Demapper demapper : morvik::link::demappers) {
+                std::vector<float> with(std::size_t{30} * bitsPerSymbol(modulation));
+                std::vector<float> without(with.size());
+                demapAnySymbols(modulation, demapper, received.symbols.data(), ones.data(), 0.1F, 30, with.data());
+                demapAnySymbols(modulation, demapper, received.symbols.data(), nullptr, 0.1F, 30, without.data());
+                EXPECT_EQ(without, with);
+            }
         }
     }
 }
