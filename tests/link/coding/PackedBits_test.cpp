@@ -65,3 +65,14 @@ TEST(PackedBitsTest, CopiesBitsAndLeavesThoseAroundThem)
         }
     }
 }
+
+TEST(PackedBitsTest, CopiesNoBitOfNoRow)
+{
+    for (std::size_t to = 0; to < 130; ++to) {
+        copyBits(nullptr, 0, 0, nullptr, to);
+    }
+    std::vector<std::uint64_t> row(3, 7);
+    const std::uint64_t word = 1234;
+    copyBits(&word, 0, 64, row.data(), 64);
+    EXPECT_EQ(row, (std::vector<std::uint64_t>{7, 1234, 7}));
+}

@@ -224,6 +224,10 @@ TEST(TransportBlockTest, PlacesValuesOfBitsThatAreSentOnce)
     }
     EXPECT_GT(seen[0], 4U);
     EXPECT_GT(seen[1], 4U);
+    // Of two code blocks of one size, the second one alone repeats a bit.
+    const auto size = static_cast<unsigned>(TransportBlockCode({6200, 12400, 1}).softSize());
+    EXPECT_TRUE(TransportBlockCode({6200, size, 1}).sendsOnce());
+    EXPECT_FALSE(TransportBlockCode({6200, size + 1, 1}).sendsOnce());
 }
 
 TEST(TransportBlockTest, IsUnderstoodByTheDecoder)

@@ -6,6 +6,7 @@
 #include <cmath>
 #include <complex>
 #include <map>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -150,7 +151,9 @@ TEST(MapperTest, IgnoresTheBitsBehindItsSymbols)
 
 TEST(ModulationTest, HasNames)
 {
+    std::set<Modulation> different;
     for (const Modulation modulation : morvik::link::modulations) {
+        EXPECT_TRUE(different.insert(modulation).second);
         EXPECT_EQ(morvik::link::modulationOf(nameOf(modulation)), modulation);
     }
     EXPECT_EQ(nameOf(Modulation::qam64), "64qam");
