@@ -136,7 +136,7 @@ TEST(TransportBlockTest, AgreesWithAnotherEncoder)
 TEST(TransportBlockTest, AgreesWithTheClauses)
 {
     Random random(1);
-    for (unsigned i = 0; i < 24; ++i) {
+    for (unsigned i = 0; i < 60; ++i) {
         TransportBlockCode code(randomFormat(random, i < 50 ? 3000 : 30000));
         std::vector<Bytes> blocks;
         for (unsigned b = 0; b < 1 + i % 3; ++b) {
