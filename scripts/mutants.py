@@ -173,6 +173,9 @@ EQUIVALENT = {
             ("reach - 1)", "reach - 0)"), ("reach - 1)", "reach + 1)"), ("reach - 1, difference)", "reach - 0, difference)"),
             ("reach - 1, difference)", "reach + 1, difference)")]),
         ("the general form of the same instruction", [("i == 0 && j == 1", "i == 0 && j == 2")]),
+        ("both halves of the vector are the same", [("part<count, 0>(permute", "part<count, 1>(permute")]),
+        ("where both are the upper halves, a and b are one vector", [("(2 + j) << 4", "(2 - j) << 4")]),
+        ("four values more, which are dropped", [("quads[2]", "quads[3]")]),
     ],
     "link/coding/CodeBlocks.cpp": [
         ("the size of no block", [("count, 0, plus->K", "count, 1, plus->K")]),
@@ -204,6 +207,10 @@ EQUIVALENT = {
             ("gain) < most", "gain) <= most"), ("nullptr ? 1 : largestOf", "nullptr ? 2 : largestOf")]),
         ("levels are odd, their number is even", [
             ("level < levels", "level <= levels"), ("rest < 0", "rest < 1"), ("rest < 0", "rest <= 0")]),
+    ],
+    "link/modulation/Modulation.h": [
+        ("listed twice, a modulation is found at its first place; tests have the list of their own compilation",
+         [("Modulation, 5>", "Modulation, 6>")]),
     ],
     "link/coding/RateMatching.cpp": [
         ("an array with more elements", [("3 * mostPositions>", "4 * mostPositions>")]),
@@ -254,6 +261,7 @@ EQUIVALENT = {
           ("run <= stepsRun", "run < stepsRun")]),
         ("one vector more, into spare room",
          [("= 0; at <", "= 0; at <=")]),
+        ("a kernel with more lanes decodes: the speed alone", [("kernel = {1,", "kernel = {0,")]),
         ("the forward recursion runs one window at a time",
          [("vectors, 1,", "vectors, 2,")]),
         ("the speed alone", [
@@ -308,7 +316,11 @@ EQUIVALENT = {
          [("(kernel.lanes /", "(kernel.lanes *"), ("+ fetchAhead)", "- fetchAhead)")]),
         ("border columns have no low bits",
          [("0 ? -1 :", "0 ? -2 :"), ("? -1 : 0;", "? -1 : 1;"), ("- 1 ? -1", "- 1 ? -2")]),
-        ("an element more", [("from[2] =", "from[3] =")]),
+        ("an element more", [
+            ("from[2] =", "from[3] ="), ("segment = 0; segment < segments", "segment = 0; segment <= segments")]),
+        ("segment 0 of a block is in its lane 0, as set before",
+         [("segment = 0; segment < segments", "segment = 1; segment < segments")]),
+        ("counted modulo a power of two", [("(segment + segments - 1)", "(segment - segments - 1)")]),
     ],
     "lanes/Pass.h": [
         ("room alone",
@@ -316,7 +328,8 @@ EQUIVALENT = {
         ("replaced in the next line",
          [("v, 0, {},", "v, 1, {},")]),
         ("no window has a single step",
-         [("(next.length != 0)", "(next.length != 1)")]),
+         [("(next.length != 0)", "(next.length != 1)"), ("end > 0;)", "end > 1;)")]),
+        ("a turn of no step", [("begin < windows.length; begin", "begin <= windows.length; begin")]),
         ("prefetches alone",
          [("+ sources[fetchAhead", "- sources[fetchAhead"), ("sources[fetchAhead *", "sources[fetchAhead +")]),
         ("g[2] is g[1]",
@@ -325,7 +338,8 @@ EQUIVALENT = {
          [("0; state", "1; state"), ("< states;", "<= states;")]),
         ("windows of one length may run side by side or not: the speed alone",
          [("r + 1 < w.windows &&", "r + 2 < w.windows &&"), ("r + 1 < w.windows &&", "r + 0 < w.windows &&"),
-          ("r + 1 < w.windows &&", "r + 1 <= w.windows &&"), ("lengthOf(r + 1)", "lengthOf(r + 2)")]),
+          ("r + 1 < w.windows &&", "r + 1 <= w.windows &&"), ("lengthOf(r + 1)", "lengthOf(r + 2)"),
+          ("r + 1 < w.windows &&", "r - 1 < w.windows &&")]),
         ("a column more, into room that is written later",
          [("for (unsigned v = 0; v < vectors; ++v) {", "for (unsigned v = 0; v <= vectors; ++v) {")]),
         ("metrics stay in bounds around any state", [("stored(m[0])", "stored(m[1])")]),
