@@ -6,10 +6,18 @@
 #include <memory>
 #include <vector>
 
+#include "rules/Arithmetic.h"
+#if defined(__SANITIZE_ADDRESS__) || MORVIK_HAS_FEATURE(address_sanitizer)
+#include <sanitizer/asan_interface.h>
+#else
+#define ASAN_POISON_MEMORY_REGION(begin, size) (static_cast<void>(begin), static_cast<void>(size))
+#define ASAN_UNPOISON_MEMORY_REGION(begin, size) (static_cast<void>(begin), static_cast<void>(size))
+#endif
+
 namespace morvik::lanes {
 
 /// Bump allocator; a null base only measures. Arrays begin on cache lines, staggered so that equal steps of different
-/// arrays map to different cache sets.
+/// arrays map to different cache sets. The address sanitizer reports accesses between them.
 class Layout {
 public:
     using Storage = std::vector<unsigned char>;
@@ -20,8 +28,13 @@ public:
     Element* take(std::size_t count)
     {
         const std::size_t offset = itsSize;
-        itsSize += (count * sizeof(Element) + line - 1) / line * line + stagger;
-        return itsBase == nullptr ? nullptr : reinterpret_cast<Element*>(itsBase + offset);
+        const std::size_t bytes = count * sizeof(Element);
+        itsSize += (bytes + line - 1) / line * line + stagger;
+        if (itsBase == nullptr) {
+            return nullptr;
+        }
+        ASAN_POISON_MEMORY_REGION(itsBase + offset + bytes, itsSize - offset - bytes);
+        return reinterpret_cast<Element*>(itsBase + offset);
     }
 
     /// Runs layOut on a layout twice: to measure, and in the storage, which grows to hold it all.
@@ -33,6 +46,7 @@ public:
         if (storage.size() < measured.itsSize + line) {
             storage = Storage(measured.itsSize + line);
         }
+        ASAN_UNPOISON_MEMORY_REGION(storage.data(), storage.size());
         void* base = storage.data();
         std::size_t space = storage.size();
         Layout placed(static_cast<unsigned char*>(std::align(line, 1, base, space)));
