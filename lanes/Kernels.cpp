@@ -189,13 +189,13 @@ struct KernelOf<Shape<1, 1>> {
             workspace, from, to, [&](const HalfIteration& half) { runPass<RuleOf, extrinsic>(workspace, half); });
     }
 
-    static constexpr Kernel kernel = {1,
-                                      1,
-                                      1,
-                                      1,
-                                      0,
+    static constexpr Kernel kernel = {1,  // lanes
+                                      1,  // vectorLanes
+                                      1,  // groupLanes
+                                      1,  // sources
+                                      0,  // permutationBytes
                                       StatePass<Greatest, Extrinsic::whole>::slotBytes,
-                                      0,
+                                      0,  // forwardBytes
                                       prepare,
                                       fill<std::int32_t>,
                                       fill<std::int16_t>,

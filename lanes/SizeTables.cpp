@@ -11,7 +11,7 @@ public:
     PermutationWriter(const Kernel& kernel, unsigned segments, const LaneOrder& order)
         : itsKernel(kernel), itsSegments(segments)
     {
-        for (unsigned lane = 0; lane < kernel.lanes; ++lane) {
+        for (unsigned lane = 0; lane < itsKernel.lanes; ++lane) {
             itsSegment[lane] = order.segment(lane);
             itsFirstLane[lane] = order.lane(order.block(lane), 0);
         }

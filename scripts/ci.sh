@@ -169,8 +169,8 @@ memory_without() {
         xargs -P "$(nproc)" -n 2 bash -euo pipefail -c 'uninitialised "$@"' uninitialised
 }
 
-# chosen PROGRAM FILTER [ARGS...]: runs the tests that FILTER chooses. GoogleTest takes none for success; here, each
-# pattern of the filter that names tests to run must choose one.
+# chosen PROGRAM FILTER [COMMAND...]: runs the tests that FILTER chooses, under COMMAND if there is one. GoogleTest takes
+# none for success; here, each pattern of the filter that names tests to run must choose one.
 chosen() {
     local patterns pattern
     IFS=: read -r -a patterns <<<"${2%%-*}"
@@ -180,7 +180,7 @@ chosen() {
             return 1
         fi
     done
-    "$1" --gtest_brief=1 --gtest_filter="$2" "${@:3}"
+    "${@:3}" "$1" --gtest_brief=1 --gtest_filter="$2"
 }
 
 # sanitized FILTER PROGRAM SHARD
@@ -194,10 +194,7 @@ sanitized() {
 
 # uninitialised PROGRAM FILTER
 uninitialised() {
-    # Valgrind takes long to start; what the filter chooses is known without it.
-    chosen "build/x86_64/tests/$1" "$2" --gtest_list_tests >/dev/null
-    MORVIK_TEST_BLOCKS=5 valgrind --quiet --error-exitcode=99 --leak-check=full \
-        "build/x86_64/tests/$1" --gtest_brief=1 --gtest_filter="$2"
+    MORVIK_TEST_BLOCKS=5 chosen "build/x86_64/tests/$1" "$2" valgrind --quiet --error-exitcode=99 --leak-check=full
 }
 
 stage_threads() {

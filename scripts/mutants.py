@@ -262,6 +262,9 @@ EQUIVALENT = {
         ("one vector more, into spare room",
          [("= 0; at <", "= 0; at <=")]),
         ("a kernel with more lanes decodes: the speed alone", [("kernel = {1,", "kernel = {0,")]),
+        ("a slice of one lane is not permuted, and no state of a forward recursion is kept: room alone", [
+            ("1,  // groupLanes", "2,  // groupLanes"), ("0,  // permutationBytes", "1,  // permutationBytes"),
+            ("0,  // forwardBytes", "1,  // forwardBytes")]),
         ("the forward recursion runs one window at a time",
          [("vectors, 1,", "vectors, 2,")]),
         ("the speed alone", [
@@ -319,7 +322,8 @@ EQUIVALENT = {
         ("an element more", [
             ("from[2] =", "from[3] ="), ("segment = 0; segment < segments", "segment = 0; segment <= segments")]),
         ("segment 0 of a block is in its lane 0, as set before",
-         [("segment = 0; segment < segments", "segment = 1; segment < segments")]),
+         [("segment = 0; segment < segments", "segment = 1; segment < segments"),
+          ("lane = 0; lane < itsKernel.lanes", "lane = 1; lane < itsKernel.lanes")]),
         ("counted modulo a power of two", [("(segment + segments - 1)", "(segment - segments - 1)")]),
     ],
     "lanes/Pass.h": [
@@ -361,6 +365,7 @@ EQUIVALENT = {
         ("a row more, which is written again, or spare room",
          [("for (unsigned i = 0; i < BestTile::size; ++i) {", "for (unsigned i = 0; i <= BestTile::size; ++i) {")]),
         ("the last eight steps may overlap those before them", [("next += 8", "next += 7"), ("next + 8 <=", "next + 9 <=")]),
+        ("segments have an even number of steps, and so have the windows of a single one", [("next + 8 <=", "next + 7 <=")]),
     ],
     "lanes/Words.h": [
         ("of equal values",
