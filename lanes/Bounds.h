@@ -14,9 +14,9 @@
 // They include the corrections of MOD#, at most 6 for each decision. So plain maxima suffice everywhere.
 //
 // In the 64 steps of a window a metric grows by at most 64 (128 + 6). A column that starts within 1300 of 0 stays
-// within 9900, and the sum of a forward and a backward metric within 20000: no 16-bit word overflows within a window.
-// Between windows, columns are normalised to about 0 by multiples of 8: a border column loses its three low bits
-// (rule 11), and clearing them commutes with such a shift.
+// within 9900, and the sum of a forward and a backward metric within 20000. Lifted branch metrics (Rules.h) add at most
+// 64 * 128 to either: no 16-bit word overflows within a window. Between windows, columns are normalised to about 0 by
+// multiples of 8: a border column loses its three low bits (rule 11), and clearing them commutes with such a shift.
 #ifndef MORVIK_LANES_BOUNDS_H
 #define MORVIK_LANES_BOUNDS_H
 

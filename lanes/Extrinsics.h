@@ -22,13 +22,13 @@ MORVIK_INLINE BranchMetrics<count> branchMetrics(Eighths<count> joint, Eighths<c
     return g;
 }
 
-/// The extrinsic value x = ratio - 2 joint is scaled, rounded down and clipped (rule 14), then halved and rounded down
+/// The extrinsic value ratio - 2 joint is scaled, rounded down and clipped (rule 14), then halved and rounded down
 /// again in the other decoder (rule 13): one rounding suffices.
 template <Extrinsic extrinsic, unsigned count>
 MORVIK_INLINE Eighths<count> nextJoint(Eighths<count> ratio, Eighths<count> joint, Eighths<count> systematic)
 {
-    const Eighths<count> x = ratio - (joint + joint);
-    const Eighths<count> half = extrinsic == Extrinsic::scaled ? Machine::scaledHalf(x) : x >> 1;
+    const Eighths<count> half =
+        extrinsic == Extrinsic::scaled ? Machine::scaledHalf(ratio - (joint + joint)) : (ratio >> 1) - joint;
     return clip(half, branchMin / 2, branchMax / 2) + systematic;
 }
 

@@ -5,6 +5,7 @@
 //   VectorLanes             the widths of its vectors
 //   Kernels                 the shapes of its kernels, ascending in lanes
 //   holdsTwoRecursions      whether its registers hold two recursions at once
+//   liftsBranches           whether recursions without corrections are faster with lifted branch metrics (Rules.h)
 //   pairsStates             whether the forward recursion over `count` lanes takes two states into a vector
 //   halves<i, j>(a, b)      half i of a, and half j of b
 //   tileHalves              halves of the widest tile that it transposes efficiently (Transpose.h)
@@ -53,6 +54,7 @@ struct Portable {
     using VectorLanes = std::integer_sequence<unsigned, 8>;
     using Kernels = Shapes<Shape<1, 1>, Shape<8, 1>, Shape<8, 2>, Shape<8, 4>>;
     static constexpr bool holdsTwoRecursions = false;
+    static constexpr bool liftsBranches = false;
     static constexpr unsigned tileHalves = 1;
 
     static constexpr bool pairsStates(unsigned, bool)
@@ -259,6 +261,7 @@ MORVIK_INLINE Eighths<16> clippedFrom(int lo, int hi, Eighths<16> a)
 struct Avx2 : Ssse3 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16>;
     using Kernels = Shapes<Shape<1, 1>, Shape<8, 1, 2>, Shape<16, 1>, Shape<16, 2>>;
+    static constexpr bool liftsBranches = sizeof(void*) == 4;
     static constexpr unsigned tileHalves = 2;
 
     static constexpr bool pairsStates(unsigned count, bool)
@@ -311,6 +314,7 @@ MORVIK_INLINE Eighths<32> permuteWords(Eighths<32> a, Eighths<32> b, Eighths<32>
 struct Avx512 : Avx2 {
     using VectorLanes = std::integer_sequence<unsigned, 8, 16, 32>;
     static constexpr bool holdsTwoRecursions = sizeof(void*) == 8;  // 32-bit code has eight registers
+    static constexpr bool liftsBranches = true;
     using Kernels = Shapes<Shape<1, 1>,
                            Shape<8, 1, 2, 4>,
                            Shape<16, 1, (holdsTwoRecursions ? 1 : 2), 2>,
@@ -423,6 +427,7 @@ MORVIK_INLINE Eighths<8> clippedFrom(int lo, int hi, Eighths<8> a)
 
 struct Neon : ByteShuffles<Portable> {
     static constexpr bool holdsTwoRecursions = true;
+    static constexpr bool liftsBranches = true;
 
     /// The high half of the doubled product.
     static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)

@@ -40,9 +40,12 @@ class Pass {
     using Paired = PairedStates<RuleOf, count>;
     using ForwardRule = RuleOf<paired ? 2 * count : count>;
 
-    /// The layout of a slot: eight forward metrics, two branch metrics (the other two repeat them) and the joint value,
-    /// each with its windows side by side. Those of a recursion with two states in a vector have one window after the
-    /// other, the metrics in their places.
+    /// Whether branch metrics are lifted (Rules.h).
+    static constexpr bool lifts = Machine::liftsBranches && !WideRule::corrects && !paired && abreast == 1;
+
+    /// The layout of a slot: eight forward metrics, the kept branch metrics and the joint value, each with its windows
+    /// side by side. Those of a recursion with two states in a vector have one window after the other, the metrics in
+    /// their places.
     static constexpr unsigned slotBranches = states * wide;
     static constexpr unsigned slotJoint = slotBranches + 2 * wide;
     static constexpr unsigned slotWords = slotJoint + (paired && abreast == 1 ? 2 * wide : wide);
@@ -85,7 +88,7 @@ public:
         Windows windows = windowsFrom(0, 0, 0, slotWords);
         runForward(windows);
         while (windows.length != 0) {
-            const Windows next = following(windows);
+            Windows next = following(windows);
             runWindows(windows, next);
             if (handedWithin && windows.r[0] == 0 && next.r[0] != 0) {
                 handBack();
@@ -108,6 +111,7 @@ private:
         unsigned from[abreast];
         std::ptrdiff_t slot;
         std::ptrdiff_t direction;
+        Value lift;  ///< of all steps; known after the forward recursion
 
         MORVIK_INLINE std::ptrdiff_t slotOf(unsigned step) const
         {
@@ -117,7 +121,7 @@ private:
 
     MORVIK_INLINE Windows windowsFrom(unsigned r, unsigned v, std::ptrdiff_t slot, std::ptrdiff_t direction) const
     {
-        Windows windows = {{}, v, 0, {}, slot, direction};
+        Windows windows = {{}, v, 0, {}, slot, direction, {}};
         windows.length = r == w.windows ? 0 : lengthOf(r);
         for (unsigned j = 0; j < abreast; ++j) {
             windows.r[j] = r;
@@ -146,7 +150,7 @@ private:
 
     /// Runs the forward recursion of windows one after another; runFirst(a) does so for the first one.
     template <class RunFirst>
-    MORVIK_INLINE void runForward(const Windows& windows, RunFirst runFirst) const
+    MORVIK_INLINE void runForward(Windows& windows, RunFirst runFirst) const
     {
         Column a = restoreForward(windows.v);
         Column start = a;
@@ -163,12 +167,12 @@ private:
         saveForward(windows.v, a);
     }
 
-    MORVIK_INLINE void runForward(const Windows& windows) const
+    MORVIK_INLINE void runForward(Windows& windows) const
     {
         runForward(windows, [&](Column& a) MORVIK_INLINE_LAMBDA { runForward(windows, 0, a); });
     }
 
-    MORVIK_INLINE void runForward(const Windows& windows, unsigned j, Column& a) const
+    MORVIK_INLINE void runForward(Windows& windows, unsigned j, Column& a) const
     {
         if constexpr (paired) {
             forwardInPairs(windows, j, a);
@@ -179,7 +183,7 @@ private:
 
     /// Runs the backward recursion of windows, together with the forward recursion of the next one if registers
     /// suffice for both: two independent dependency chains keep the execution units busy.
-    MORVIK_INLINE void runWindows(const Windows& windows, const Windows& next) const
+    MORVIK_INLINE void runWindows(const Windows& windows, Windows& next) const
     {
         WideColumn b = startColumn(windows);
         if constexpr (overlapped) {
@@ -197,18 +201,21 @@ private:
                 runForward(next);
             }
         }
-        storeReached(windows, b);
+        storeReached(windows, lowered(b, windows));
     }
 
     static constexpr bool overlapped = Machine::holdsTwoRecursions && !WideRule::corrects && !paired;
 
-    MORVIK_INLINE void forward(const Windows& windows, unsigned j, Column& a) const
+    MORVIK_INLINE void forward(Windows& windows, unsigned j, Column& a) const
     {
         std::int16_t* slot = itsSlots + windows.slot + j * count;
+        Value lift{};
         for (std::size_t i = 0; i < windows.length; ++i) {
-            forwardStep(at(windows, j, i), slot, a);
+            forwardStep(at(windows, j, i), slot, a, lift);
             slot += windows.direction;
         }
+        windows.lift = lift;
+        a = lowered(a, windows);
     }
 
     /// The same with two states in a vector. Not inlined, since its addresses take most of the registers.
@@ -258,29 +265,55 @@ private:
     }
 
     /// Runs all forward steps of the next window, which is not longer, and as many backward steps of the windows.
-    MORVIK_INLINE void both(const Windows& windows, WideColumn& b, const Windows& next, Column& a) const
+    MORVIK_INLINE void both(const Windows& windows, WideColumn& b, Windows& next, Column& a) const
     {
         const std::int16_t* slot = itsSlots + windows.slotOf(windows.length);
         std::int16_t* nextSlot = itsSlots + next.slot;
+        Value lift{};
         for (std::size_t i = 0; i < next.length; ++i) {
             slot -= windows.direction;
             backwardStep(windows, windows.length - 1 - i, slot, b);
-            forwardStep(at(next, 0, i), nextSlot, a);
+            forwardStep(at(next, 0, i), nextSlot, a, lift);
             nextSlot += next.direction;
+        }
+        next.lift = lift;
+        a = lowered(a, next);
+    }
+
+    /// Takes back what the branch metrics of the windows' steps have lifted the metrics by.
+    template <class Metrics>
+    static MORVIK_INLINE Metrics lowered(Metrics m, [[maybe_unused]] const Windows& windows)
+    {
+        if constexpr (lifts) {
+            rules::forEach<states>([&](auto state) MORVIK_INLINE_LAMBDA { m[state] = m[state] - windows.lift; });
+        }
+        return m;
+    }
+
+    /// Branch metrics as they are kept.
+    template <unsigned lanes>
+    static MORVIK_INLINE auto branches(const KeptBranches<lanes>& kept)
+    {
+        if constexpr (lifts) {
+            return liftedBranches<lanes>(kept);
+        } else {
+            return plainBranches<lanes>(kept);
         }
     }
 
     /// Runs step `i` of all vectors' steps. `slot` points to the window's lanes.
-    MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a) const
+    MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a, Value& lift) const
     {
         const Value joint = jointAt(i);
         const BranchMetrics<count> g = branchMetrics(joint, Value::load(itsParity + i * count));
         rules::forEach<states>([&](auto state)
                                    MORVIK_INLINE_LAMBDA { Decision::stored(a[state]).store(slot + state * wide); });
-        g[0].store(slot + slotBranches);
-        g[1].store(slot + slotBranches + wide);
+        const KeptBranches<count> kept = lifts ? lifted<count>(g) : KeptBranches<count>{g[0], g[1]};
+        kept[0].store(slot + slotBranches);
+        kept[1].store(slot + slotBranches + wide);
         joint.store(slot + slotJoint);
-        a = rules::forwardStep(itsRule.decision(), a, g);
+        a = rules::forwardStep(itsRule.decision(), a, branches<count>(kept));
+        lift = lift + g[0];
     }
 
     /// The same for window `j` of a slot, after `steps` steps of it.
@@ -341,9 +374,7 @@ private:
                                     WideColumn& b) const
     {
         const Slot<steps> slot = {words};
-        const WideValue g0 = slot.branch(0);
-        const WideValue g1 = slot.branch(1);
-        const WideValue ratio = itsWideRule.stepBack(slot, b, {g0, g1, g1, g0});
+        const WideValue ratio = itsWideRule.stepBack(slot, b, branches<wide>({slot.branch(0), slot.branch(1)}));
         if (itsRatios != nullptr) {
             storeValues(windows, i, ratio, itsRatios);
         }

@@ -300,6 +300,7 @@ EQUIVALENT = {
     ],
     "lanes/Rules.h": [
         ("an array with an element more", [("half[2]", "half[3]")]),
+        ("g[2] is g[1]", [("g[0] + g[1]", "g[0] + g[2]")]),
         ("of pairs 1 and 3, which half", [
             ("half[pair / 2] = rule", "half[pair / 3] = rule"), ("decide(half[pair / 2]", "decide(half[pair / 3]")]),
     ],
@@ -336,8 +337,7 @@ EQUIVALENT = {
         ("a turn of no step", [("begin < windows.length; begin", "begin <= windows.length; begin")]),
         ("prefetches alone",
          [("+ sources[fetchAhead", "- sources[fetchAhead"), ("sources[fetchAhead *", "sources[fetchAhead +")]),
-        ("g[2] is g[1]",
-         [("g[1].store(slot", "g[2].store(slot")]),
+        ("g[2] is g[1]", [("{g[0], g[1]}", "{g[0], g[2]}")]),
         ("state 0 is 0 in border columns; a column more, into spare room",
          [("0; state", "1; state"), ("< states;", "<= states;")]),
         ("windows of one length may run side by side or not: the speed alone",
