@@ -432,6 +432,7 @@ struct Neon : ByteShuffles<Portable> {
     /// The high half of the doubled product.
     static MORVIK_INLINE Eighths<8> scaledHalf(Eighths<8> a)
     {
+        static_assert(halfOfScale % 2 == 0);
         return {(Raw<8>::Signed)vqdmulhq_n_s16((int16x8_t)a.v, halfOfScale / 2)};
     }
 

@@ -30,7 +30,9 @@ static_assert(MORVIK_CHECKER_ALPHA == morvik::signalsOf(Stage::forward).first);
 static_assert(MORVIK_CHECKER_BETA == morvik::signalsOf(Stage::backward).first);
 static_assert(MORVIK_CHECKER_LLR == morvik::signalsOf(Stage::ratio).first);
 static_assert(MORVIK_CHECKER_EXTRINSIC == morvik::signalsOf(Stage::extrinsic).first);
-static_assert(MORVIK_CHECKER_SIGNALS == morvik::signalCount);
+static_assert(
+    MORVIK_CHECKER_SIGNALS == morvik::signalCount,
+    "the numbers of signals have changed: morvik_checker.h, morvik_pkg.sv and morvik_checker_pkg.vhd need them");
 
 struct morvik_checker {
     std::optional<Checker> checker;

@@ -7,6 +7,8 @@
 #include <random>
 
 #include "Units.h"
+#include "rules/Algorithms.h"
+#include "rules/Formats.h"
 
 namespace morvik::units {
 
@@ -240,6 +242,10 @@ void directPending(Random& random, const Take& take)
     }
 }
 
+/// Half way from the largest extrinsic value to the next one, before type 1 scales it: 127.5 / 0.75.
+constexpr std::int32_t scaledEdge =
+    ((2 * rules::largestOf(rules::branchBits) + 1) << rules::scaleBits) / (2 * rules::scaleNumerator);
+
 /// For every intrinsic value the differences about which the result is clipped or rounded, and every ratio with a few.
 void directExtrinsic(const Take& take)
 {
@@ -247,7 +253,7 @@ void directExtrinsic(const Take& take)
         for (const std::int32_t ratio : {metric.lowest, -1, 0, 1, metric.highest}) {
             take({ratio, t});
         }
-        for (const std::int32_t middle : {-170, -128, 0, 128, 170}) {  // 170 is 127.5 / 0.75
+        for (const std::int32_t middle : {-scaledEdge, -128, 0, 128, scaledEdge}) {
             for (std::int32_t difference = middle - 3; difference <= middle + 3; ++difference) {
                 take({2 * t + difference, t});
             }
