@@ -15,8 +15,10 @@
 //
 // In the 64 steps of a window a metric grows by at most 64 (128 + 6). A column that starts within 1300 of 0 stays
 // within 9900, and the sum of a forward and a backward metric within 20000. Lifted branch metrics (Rules.h) add at most
-// 64 * 128 to either: no 16-bit word overflows within a window. Between windows, columns are normalised to about 0 by
-// multiples of 8: a border column loses its three low bits (rule 11), and clearing them commutes with such a shift.
+// 64 * 128 to a metric, and no more to the sum: the steps before lift its forward metric, those after its backward
+// metric, and its own step the branch. So it stays within 28200, and no 16-bit word overflows within a window. Between
+// windows, columns are normalised to about 0 by multiples of 8: a border column loses its three low bits (rule 11), and
+// clearing them commutes with such a shift.
 #ifndef MORVIK_LANES_BOUNDS_H
 #define MORVIK_LANES_BOUNDS_H
 

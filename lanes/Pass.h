@@ -40,7 +40,7 @@ class Pass {
     using Paired = PairedStates<RuleOf, count>;
     using ForwardRule = RuleOf<paired ? 2 * count : count>;
 
-    /// Whether branch metrics are lifted (Rules.h).
+    /// Whether branch metrics are lifted (Rules.h), which Windows::lift keeps for one window.
     static constexpr bool lifts = Machine::liftsBranches && !WideRule::corrects && !paired && abreast == 1;
 
     /// The layout of a slot: eight forward metrics, the kept branch metrics and the joint value, each with its windows
@@ -302,7 +302,7 @@ private:
     }
 
     /// Runs step `i` of all vectors' steps. `slot` points to the window's lanes.
-    MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a, Value& lift) const
+    MORVIK_INLINE void forwardStep(std::size_t i, std::int16_t* slot, Column& a, [[maybe_unused]] Value& lift) const
     {
         const Value joint = jointAt(i);
         const BranchMetrics<count> g = branchMetrics(joint, Value::load(itsParity + i * count));
@@ -313,7 +313,9 @@ private:
         kept[1].store(slot + slotBranches + wide);
         joint.store(slot + slotJoint);
         a = rules::forwardStep(itsRule.decision(), a, branches<count>(kept));
-        lift = lift + g[0];
+        if constexpr (lifts) {
+            lift = lift + g[0];
+        }
     }
 
     /// The same for window `j` of a slot, after `steps` steps of it.

@@ -62,6 +62,7 @@ struct DecideGreatest : rules::DecideMax<Eighths<count>> {
         return m + g.one;
     }
 
+    /// On bit 0.
     static MORVIK_INLINE Eighths<count> subtract(Eighths<count> m, const LiftedBranch<count>& g)
     {
         return m + g.zero;

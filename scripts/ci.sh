@@ -174,7 +174,7 @@ memory_without() {
 chosen() {
     local patterns pattern
     IFS=: read -r -a patterns <<<"${2%%-*}"
-    for pattern in "${patterns[@]}"; do
+    for pattern in "${patterns[@]}" "$2"; do
         if [ -z "$("$1" --gtest_list_tests --gtest_filter="$pattern" | sed -n '/^  /p')" ]; then
             echo "$1 has no test $pattern" >&2
             return 1

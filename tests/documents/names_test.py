@@ -19,8 +19,8 @@ LISTS_OF_INSTRUCTION_SETS = ["include/morvik_v1_0_batch.h", "docs/batch.md", "do
 LISTS_OF_SUBCOMMANDS = ["README.md", "docs/tools.md"]
 SOURCES = {".cpp", ".h", ".def", ".py", ".sh", ".txt", ".cmake", ".json", ".sv", ".vhd", ".js", ".mjs", ""}
 
-# What a reader puts a name of his own in place of, and what a build writes.
-PLACEHOLDER = re.compile(r"[A-Z]{4,}|[<*]|^build/")
+# Placeholders, and files that a build writes.
+PLACEHOLDER = re.compile(r"NAME|FOLDER|PRESET|[<*]|^build/")
 
 
 def tree_files():
@@ -32,29 +32,40 @@ def tree_files():
 
 def quoted(document):
     text = re.sub(r"^```.*?^```$", "", (TREE / document).read_text(), flags=re.MULTILINE | re.DOTALL)
-    return sorted(set(re.findall(r"`([^`\n]+)`", text)))
+    spans = re.findall(r"`([^`]+)`", text)
+    return sorted({re.sub(r"\s+", " ", span).removeprefix("./") for span in spans})
+
+
+def paths(document):
+    """Those quoted with a folder, or as a folder, or with the ending of a source."""
+    path = re.compile(r"[\w.-]+(/[\w.-]+)+/?|[\w.-]+/|[\w.-]+\.(cpp|h|def|py|pyi|sh|cmake|json|txt|md|sv|vhd|js|css|cfg)")
+    return [name for name in quoted(document) if path.fullmatch(name) and not PLACEHOLDER.search(name)]
+
+
+def names(document):
+    """Those of the code: in mixed case, with an underscore or a namespace."""
+    return [name for name in quoted(document)
+            if re.fullmatch(r"[A-Za-z]\w*(::\w+)*", name) and re.search(r"[a-z][A-Z]|_|::", name)
+            and not PLACEHOLDER.search(name)]
 
 
 def missing_paths(document, files):
-    """Those quoted with a folder. A part of a tree is enough, as are names without an extension, such as `Passes`."""
-    paths = [name for name in (quote.removeprefix("./") for quote in quoted(document))
-             if re.fullmatch(r"[\w.-]+(/[\w.-]+)+/?", name) and not PLACEHOLDER.search(name)]
+    """A part of the tree is enough, as are names without an extension, such as `hardware/testbench/Passes`."""
     text = "\n" + "\n".join(files) + "\n"
-    for path in paths:
+    for path in paths(document):
         if not re.search(rf"[\n/]{re.escape(path)}" + ("" if path.endswith("/") else r"[./\n]"), text):
             yield f"{document} names `{path}`, which is not there"
 
 
 def missing_names(document, files):
-    """Names of the code: in mixed case, or with an underscore."""
-    names = [name for name in quoted(document)
-             if re.fullmatch(r"[A-Za-z]\w*", name) and re.search(r"[a-z][A-Z]|_", name) and not PLACEHOLDER.search(name)]
     words = set(re.findall(r"\w+", "\n".join(files)))
     for file in files:
         path = TREE / file
         if path.suffix in SOURCES and path.stat().st_size < 1 << 20:
             words.update(re.findall(r"\w+", path.read_text(errors="replace")))
-    yield from (f"{document} names `{name}`, which no source has" for name in names if name not in words)
+    for name in names(document):
+        if not words.issuperset(name.split("::")):
+            yield f"{document} names `{name}`, which no source has"
 
 
 def unnamed(kind, names, documents):
@@ -89,7 +100,7 @@ def main():
              *without_placeholder(morvik, subcommands)]
     if wrong or not sets or not subcommands:
         sys.exit("\n".join(wrong) or __doc__)
-    print(f"{len(quoted('CONTRIBUTING.md'))} names, {len(sets)} instruction sets, {len(subcommands)} subcommands")
+    print(f"{len(paths('CONTRIBUTING.md'))} paths, {len(names('CONTRIBUTING.md'))} names, {len(sets)} instruction sets, {len(subcommands)} subcommands")
 
 
 if __name__ == "__main__":

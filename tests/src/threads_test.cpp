@@ -1,7 +1,7 @@
-// Threads: states used by a thread each at the same time give what they give alone.
+// Threads: threads that each use their own state at the same time get the results they get alone.
 //
 // The thread sanitizer reports a race only while it remembers what the other thread did, which is few blocks long.
-// Threads that meet before each short block pass the same lines soon after each other.
+// Threads that meet before each short block run the same code at nearly the same time.
 #include <gtest/gtest.h>
 
 #include <atomic>
@@ -26,7 +26,7 @@ std::vector<std::vector<std::uint8_t>> decodeMany(int units, int algorithm)
     return decisions;
 }
 
-/// Lets threads start each block together. Orders no memory, which would hide races from the thread sanitizer.
+/// Lets threads start each block together. Does not order memory accesses: that would hide races from the sanitizer.
 class Meeting {
 public:
     explicit Meeting(unsigned threads) : itsThreads(threads) {}
