@@ -164,7 +164,7 @@ void LanePath::count(unsigned iterations)
     TDecoder3GPU& decoder = itsOriginals.decoder();
     itsIterations = iterations;
     decoder.itsDecodeCount += itsTaken;
-    decoder.itsHalfIterationCount += std::uint64_t{2} * iterations * itsTaken;
+    decoder.itsHalfIterationCount += std::uint64_t{morvik::rules::halfIterations(iterations)} * itsTaken;
 }
 
 std::size_t LanePath::blockSize() const

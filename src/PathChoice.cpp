@@ -42,7 +42,7 @@ void PathChoice::catchUp()
     itsMissedBlocks.computeColumns();
 }
 
-/// A decoder put in by a test bench since, even at the same address, has not decoded the lanes' blocks.
+/// If a test bench has replaced the decoder, the new one has not decoded these blocks, even at the same address.
 void PathChoice::forgetBlocksOfOthers()
 {
     if (itsState.decoder != &itsOriginals.decoder() || typeid(*itsState.decoder) != typeid(TDecoder3GPU) ||

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Each folder includes only what stands below it.
+"""Each folder includes only what stands below it, and rules/ allocates nothing.
 
   floors.py ROOT
 """
@@ -42,16 +42,32 @@ def floor_of(path):
     return next(str(parent) for parent in path.parents if str(parent) in BELOW)
 
 
+def includes(text, root):
+    """The project's own headers, however the include is written."""
+    for mark, header in re.findall(r'^\s*#\s*include\s*([<"])([^">]+)[">]', text, re.MULTILINE):
+        if mark == '"' or (root / header.split("/")[0]).is_dir():
+            yield header
+
+
+def allocations(root):
+    for path in sorted((root / "rules").rglob("*.h")):
+        code = re.sub(r"//.*", "", path.read_text())
+        for word in re.findall(r"\bnew\b|\b[mc]alloc\b|\bstd::(?:vector|string|unique_ptr)\b", code):
+            yield f"{path.relative_to(root)} allocates: {word}"
+
+
 def main():
     root = pathlib.Path(sys.argv[1])
     included = 0
-    mistakes = []
+    mistakes = list(allocations(root))
     for folder, below in BELOW.items():
         allowed = {folder, *below.split()}
         sources = (path for path in (root / folder).rglob("*") if path.suffix in (".h", ".cpp", ".def", ".in")
                    and floor_of(path.relative_to(root)) == folder)
+        read = 0
         for path in sources:
-            for header in re.findall(r'^#include "([^"]+)"', path.read_text(), re.MULTILINE):
+            read += 1
+            for header in includes(path.read_text(), root):
                 # A bare name is a neighbour, or a header of include/.
                 place = header.rpartition("/")[0] or folder
                 included += 1
@@ -59,6 +75,8 @@ def main():
                     mistakes.append(f"{path.relative_to(root)} includes {header}")
                 elif not any((root / at / header.rpartition("/")[2]).exists() for at in (place, "include")):
                     mistakes.append(f"{path.relative_to(root)} includes {header}, which is in neither {place}/ nor include/")
+        if read == 0:
+            mistakes.append(f"{folder}/ has no source")
     print("\n".join(mistakes) or f"{included} includes in {len(BELOW)} folders lead down")
     return 1 if mistakes or included == 0 else 0
 
