@@ -61,7 +61,8 @@ public:
     constexpr Cut(std::uint32_t K, std::uint32_t units, std::uint32_t threadsOfEach = threadsOfUnit)
         : itsK(K),
           itsUnits(units),
-          itsSegments(segmentCount(K, std::uint64_t{units} * threadsOfEach)),
+          itsThreads(std::uint64_t{units} * threadsOfEach),
+          itsSegments(segmentCount(K, itsThreads)),
           itsLength(K / itsSegments)
     {
     }
@@ -74,6 +75,12 @@ public:
     constexpr std::uint32_t units() const
     {
         return itsUnits;
+    }
+
+    /// Of all units.
+    constexpr std::uint64_t threads() const
+    {
+        return itsThreads;
     }
 
     /// Whether all segments are equally long; the core refuses any other block (rule 17).
@@ -197,6 +204,7 @@ private:
 
     std::uint32_t itsK;
     std::uint32_t itsUnits;
+    std::uint64_t itsThreads;
     std::uint32_t itsSegments;
     std::uint32_t itsLength;
 };

@@ -11,6 +11,12 @@ constexpr unsigned halfIterations(unsigned iterations)
     return 2 * iterations;
 }
 
+/// The iterations that the first h half-iterations complete.
+constexpr unsigned completeIterations(unsigned h)
+{
+    return h / 2;
+}
+
 /// The constituent decoder of half-iteration h: 0 works in natural order, 1 in interleaved order. The last
 /// half-iteration of a decode is odd, so every decode ends in natural order (rule 15).
 constexpr unsigned constituentOf(unsigned h)

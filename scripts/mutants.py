@@ -153,6 +153,10 @@ EQUIVALENT = {
          [("control[2 * lane + 1] = 0", "control[2 * lane + 1] = 1")]),
         ("vectors of eight lanes have one half",
          [("tileHalves = 1;", "tileHalves = 2;"), ("tileHalves = 1;", "tileHalves = 0;")]),
+        ("which kernels lift branch metrics: the speed alone", [
+            ("liftsBranches = sizeof(void*) == 4", "liftsBranches = sizeof(void*) == 5"),
+            ("liftsBranches = sizeof(void*) == 4", "liftsBranches = sizeof(void*) == 3"),
+            ("liftsBranches = sizeof(void*) == 4", "liftsBranches = sizeof(void*) != 4")]),
         ("more room, or a source that is not read",
          [("static constexpr unsigned sources = count / group;", "static constexpr unsigned sources = count * group;"),
           ("bytes = 2", "bytes = 3"), ("sources = 1;", "sources = 2;")]),
@@ -347,6 +351,9 @@ EQUIVALENT = {
         ("a column more, into room that is written later",
          [("for (unsigned v = 0; v < vectors; ++v) {", "for (unsigned v = 0; v <= vectors; ++v) {")]),
         ("metrics stay in bounds around any state", [("stored(m[0])", "stored(m[1])")]),
+        ("which kernels lift branch metrics: the speed alone", [
+            ("!paired && abreast == 1;", "!paired && abreast == 2;"), ("!paired && abreast == 1;", "!paired && abreast == 0;"),
+            ("!paired && abreast == 1;", "!paired && abreast != 1;")]),
         ("the place of the joint values of a slot: room, and the speed", [
             ("paired && abreast == 1 ?", "paired && abreast == 2 ?"), ("paired && abreast == 1 ?", "paired && abreast == 0 ?"),
             ("paired && abreast == 1 ?", "paired && abreast != 1 ?"), ("paired && abreast == 1 ?", "paired || abreast == 1 ?"),

@@ -4,9 +4,9 @@
 #include <memory>
 #include <stdexcept>
 
-#include "TInterleaver.h"
-#include "TNumberFormat.h"
 #include "rules/BlockSizes.h"
+#include "src/TInterleaver.h"
+#include "src/TNumberFormat.h"
 
 namespace morvik {
 

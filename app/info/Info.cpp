@@ -1,6 +1,7 @@
 // Info: the subcommand that shows how the core handles a block size.
 #include "Info.h"
 
+#include <cinttypes>
 #include <cstdint>
 #include <cstdio>
 #include <memory>
@@ -58,9 +59,9 @@ std::string layoutText(const BlockLayout& layout)
         char line[80];
         std::snprintf(line,
                       sizeof line,
-                      "%5u %8u %9u %14u %5u  ",
+                      "%5u %8" PRIu64 " %9u %14u %5u  ",
                       cut.units(),
-                      cut.units() * rules::threadsOfUnit,
+                      cut.threads(),
                       cut.segments(),
                       cut.segmentLength(),
                       cut.rows());
@@ -131,7 +132,7 @@ Json cutJson(const rules::Cut& cut)
             {{"segment", window.segment}, {"row", window.row}, {"first", window.first}, {"last", window.last}});
     }
     return {{"num_pu", cut.units()},
-            {"threads", cut.units() * rules::threadsOfUnit},
+            {"threads", cut.threads()},
             {"segments", cut.segments()},
             {"segment_length", cut.segmentLength()},
             {"rows", cut.rows()},

@@ -4,6 +4,7 @@
 #include <algorithm>
 
 #include "base/Text.h"
+#include "rules/Schedule.h"
 
 namespace morvik::comparison {
 
@@ -79,9 +80,11 @@ Coverage coverageOf(const Model& model, const Dump& dump)
     }
     std::sort(coverage.gapSignals.begin(), coverage.gapSignals.end());
     const auto& absent = coverage.absentPasses;
-    if (!absent.empty() && absent.front() > 0 && absent.front() % 2 == 0 &&
-        absent.front() + absent.size() == dump.values.passes()) {
-        coverage.iterations = absent.front() / 2;
+    if (!absent.empty() && absent.front() + absent.size() == dump.values.passes()) {
+        const unsigned iterations = rules::completeIterations(absent.front());
+        if (iterations > 0 && rules::halfIterations(iterations) == absent.front()) {
+            coverage.iterations = iterations;
+        }
     }
     return coverage;
 }

@@ -1,5 +1,5 @@
 // Decisions: value types for the trellis steps of rules/Trellis.h, by each algorithm and with mistakes that hardware
-// may have.
+// may have. Functions have the names of what the core does; some of a mistake's do something else in its place.
 #ifndef MORVIK_HARDWARE_COMPARISON_DECISIONS_H
 #define MORVIK_HARDWARE_COMPARISON_DECISIONS_H
 

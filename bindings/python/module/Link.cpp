@@ -18,6 +18,7 @@
 #include "link/random/Random.h"
 #include "link/random/SamplerForm.h"
 #include "rules/BlockSizes.h"
+#include "rules/Interleaver.h"
 #include "rules/Tail.h"
 
 namespace py = pybind11;
@@ -30,10 +31,10 @@ using namespace morvik::link;
 
 Array<std::int64_t> interleaver(unsigned K)
 {
-    const rules::BlockSize& row = *rules::findBlockSize(K);
+    rules::InterleaverAddress address(*rules::findBlockSize(K));
     Array<std::int64_t> positions(static_cast<py::ssize_t>(K));
-    for (std::uint64_t i = 0; i < K; ++i) {
-        positions.mutable_data()[i] = static_cast<std::int64_t>((row.f1 * i + row.f2 * i * i) % K);
+    for (unsigned i = 0; i < K; ++i) {
+        positions.mutable_data()[i] = address.next();
     }
     return positions;
 }
